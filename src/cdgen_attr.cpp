@@ -1,0 +1,84 @@
+/* cdgen_attr.cpp: one attribute line: its syntax, the order and repetition rules. */
+
+#include "cdgen_attr.h"
+
+#include <cstdio>
+
+namespace {
+
+constexpr size_t VALUE_MAX_CHARS = LOCATOR_SIZE - 1;
+
+/* The name and value of a line; a null name when there is nothing to store. */
+struct name_value {
+    const char *name;
+    char *value;
+};
+
+name_value split_line(cdgen &cx, char *il) {
+    char *name = il + strspn(il, " \t");
+    cx.linepos = 1 + static_cast<int>(name - il);
+    if (*name == '\0')
+        return {};
+    char *value = strchr(name, '=');
+    if (value == nullptr)
+        source_error(cx, "Missing '=' after attribute name");
+    *value++ = '\0';
+    if (strcmp(value, "\"\"") == 0)
+        return {};
+    char *unquoted = strip_quotes(value);
+    if (unquoted == nullptr)
+        source_error(cx, "Unmatched double quotes for attribute: ", name);
+    if (strlen(unquoted) > VALUE_MAX_CHARS)
+        source_error(cx, "Attibute value exceeds maximum length: ", name); /* deliberately spelled so */
+    cx.linepos = 1 + static_cast<int>(unquoted - il);
+    return {name, unquoted};
+}
+
+const table_attrs &find_attr(cdgen &cx, const srtable_ctrl &scp, const char *name) {
+    for (const table_attrs &attr : scp.sc_attrs)
+        if (strcmp(attr.ta_name, name) == 0)
+            return attr;
+    source_error(cx, "Attribute name not defined in table (name/table): ", name, scp.sc_name);
+}
+
+/* Optional attributes follow the required ones; most may stand once. */
+void count_optional(cdgen &cx, const srtable_ctrl &scp, stanza_state &state, const table_attrs &attr) {
+    if (state.req_mask != scp.req_mask_cmplt)
+        source_error(cx, "Optional attribute discovered before all required attributes have been defined",
+                     attr.ta_name);
+    if ((state.opt_mask & attr.req_bit & ~OPTIONAL) != 0 && !attr.dup_allowed)
+        source_error(cx, "Already defined. Duplicated definitions not allowed for ", attr.ta_name);
+    state.opt_mask |= attr.req_bit;
+}
+
+void count_required(cdgen &cx, stanza_state &state, const table_attrs &attr) {
+    if ((state.req_mask & attr.req_bit) != 0 && !attr.dup_allowed)
+        source_error(cx, "Already defined. Duplicated definitions not allowed for ", attr.ta_name);
+    state.req_mask |= attr.req_bit;
+    if (cx.debugLevel >= 2)
+        printf("Added %x to mask, which is now %x\n", attr.req_bit, state.req_mask);
+}
+
+} // namespace
+
+void save_attr(cdgen &cx, char *il, int table_id) {
+    auto [name, value] = split_line(cx, il);
+    if (name == nullptr)
+        return;
+    const srtable_ctrl &scp = sc_tables[static_cast<size_t>(table_id)];
+    stanza_state &state = cx.stanzas[static_cast<size_t>(table_id)];
+    const table_attrs &attr = find_attr(cx, scp, name);
+    if (*value == '\0') {
+        printf("In file %s: ", cx.cdefsrc);
+        source_error(cx, "Missing attribute value: ", name);
+    }
+    if (cx.debugLevel >= 2)
+        printf("%s: found attr: \"%s\", value: \"%s\",length: %d\n", scp.sc_name, name, value,
+               static_cast<int>(strlen(value)));
+    if ((attr.req_bit & OPTIONAL) != 0)
+        count_optional(cx, scp, state, attr);
+    else
+        count_required(cx, state, attr);
+    cx.line_texts.clear();
+    store_value({cx, scp, state, static_cast<char *>(scp.sc_cb(cx)), attr, value});
+}

@@ -1,0 +1,20 @@
+/* cdgen_attr.h: from the attribute line parser to the value handlers. */
+#ifndef CDGEN_CDGEN_ATTR_H
+#define CDGEN_CDGEN_ATTR_H
+
+#include "cdgen.h"
+
+/* A checked attribute line. */
+struct attr_line {
+    cdgen &cx;
+    const srtable_ctrl &scp; /* the stanza's kind */
+    stanza_state &state;
+    char *record; /* the kind's staging record */
+    const table_attrs &attr;
+    char *value; /* not empty; may be taken apart */
+};
+
+/* Converts the value and stores it, by the attribute's type. */
+void store_value(const attr_line &line);
+
+#endif

@@ -1,0 +1,7 @@
+/* cdgen_main.cpp: the program's entry; everything else is a library that tests link too. */
+
+#include "cdgen.h"
+
+int main(int argc, char **argv) {
+    return cdgen_main(argc, argv);
+}

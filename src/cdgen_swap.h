@@ -1,0 +1,52 @@
+/* cdgen_swap.h: reversing the byte order of single records, in place. Everything is read in native order before it is
+ * reversed, and what a reference leads to is reversed before the reference. */
+#ifndef CDGEN_CDGEN_SWAP_H
+#define CDGEN_CDGEN_SWAP_H
+
+#include "cdb.h"
+
+#include <cstddef>
+#include <vector>
+
+/* A table that references lead into. Hands out each thing in it once, and only what lies inside. */
+class swap_area {
+public:
+    swap_area(char *start, size_t bytes) : base(start), size(bytes), taken(bytes / ALIGNMENT) {}
+
+    /* The address of what stands at an offset: a head of head bytes that begins with or contains, at count_at and
+     * count_width bytes wide, the number of entries of entry bytes that follow. Null if it is not all inside, or if it
+     * has been handed out before. */
+    char *take(vx_uint32_t offset, size_t head, size_t count_at = 0, size_t entry = 0);
+
+private:
+    /* Lists, definitions and values stand on 8-byte boundaries; on no 4-byte boundary there is nothing. */
+    static constexpr size_t ALIGNMENT = 4;
+
+    char *base;
+    size_t size;
+    std::vector<bool> taken;
+};
+
+/* The reversal of a field of 2, 4 or 8 bytes; other widths are left alone. */
+void swap_any(char *field, int width);
+
+/* The cell and, where sbase_p has it, the out-of-line value. */
+void swap_value(char *value, vx_data_type_t type, swap_area &sbase_p);
+
+void swap_var_list(char *list);
+void swap_valid_vals(char *vv, vx_data_type_t type, swap_area &sbase_p);
+void swap_sd_def(char *sd, swap_area &vvbase_p, swap_area &sbase_p);
+
+/* count records from the first on, with what they refer to. */
+void swap_pattr(char *first, vx_uint32_t count, swap_area &sbase_p, swap_area &vvbase_p, swap_area &vlbase_p,
+                swap_area &sdbase_p);
+void swap_dattr(char *first, vx_uint32_t count, swap_area &sbase_p, swap_area &vvbase_p, swap_area &vlbase_p,
+                swap_area &sdbase_p);
+void swap_action(char *first, vx_uint32_t count, swap_area &sbase_p, swap_area &vvbase_p, swap_area &vlbase_p,
+                 swap_area &sdbase_p);
+void swap_errors(char *first, vx_uint32_t count, swap_area &sbase_p, swap_area &vvbase_p, swap_area &vlbase_p,
+                 swap_area &sdbase_p);
+void swap_depends(char *first, vx_uint32_t count, swap_area &sbase_p, swap_area &vvbase_p, swap_area &vlbase_p,
+                  swap_area &sdbase_p);
+
+#endif

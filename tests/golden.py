@@ -1,0 +1,283 @@
+"""Run the golden cases: one source, one expectation beside it.
+
+A case is NAME.cdefsrc with NAME.expect (the expectation alone when the case
+needs no source).  The expectation holds 'key: value' lines:
+
+    args:      options put before the operands
+    out:       name of the output file (default out.cdef)
+    operands:  the operands instead of 'NAME.cdefsrc out'
+    status:    exit status (default 0)
+    setup:     mkdir NAME | file NAME TEXT | symlink TARGET NAME | hardlink TARGET NAME
+    message:   free: one line on stderr whose wording no rule fixes
+
+and blocks of lines that begin with '|': stdout:, stderr:, and the same with
+'-no-newline' for a last line without one.  A stream without a block must stay
+empty.  'image:' starts the description of the file (see cdb_image.py);
+'image-little:' and 'image-big:' state the file's bytes in hexadecimal.  The
+image blocks run to the next 'image...:' line or the end.
+
+Every case runs in a fresh directory, with the program reached as ./cdgen, so
+that messages that name the program or a file are the same everywhere.  A
+failing run must leave the directory's files as they were.
+"""
+
+import argparse
+import os
+import pathlib
+import re
+import shlex
+import subprocess
+import sys
+import tempfile
+
+import cdb_image
+import reverse_cdb
+
+KEYS = {"args", "out", "operands", "status", "setup", "message"}
+BLOCKS = {"stdout", "stderr", "stdout-no-newline", "stderr-no-newline"}
+IMAGES = {"image", "image-little", "image-big"}
+TIMEOUT = 60
+REPORT_LINES = 25
+
+
+class Case:
+    """One parsed expectation."""
+
+    def __init__(self, path):
+        self.expect = path.with_suffix(".expect")
+        self.source = path.with_suffix(".cdefsrc")
+        self.name = self.expect.with_suffix("").as_posix()
+        self.keys = {}
+        self.setup = []
+        self.streams = {"stdout": b"", "stderr": b""}
+        self.images = {}
+        self.parse(self.expect.read_bytes().decode())
+
+    def parse(self, text):
+        """Read the expectation; an unknown key is an error in the case."""
+        block, image = None, None
+        collected = {}
+        for line in text.split("\n"):
+            key, _, value = line.partition(":")
+            if key in IMAGES and not value.strip():
+                image, block = key, None
+                self.images[image] = []
+            elif image:
+                self.images[image].append(line)
+            elif line.startswith("|"):
+                collected[block].append(line[1:])
+            elif key in BLOCKS and not value:
+                block = key
+                collected[block] = []
+            elif key == "setup":
+                self.setup.append(shlex.split(value))
+            elif key in KEYS:
+                self.keys[key] = value.strip()
+            elif line.strip() and not line.startswith("#"):
+                raise ValueError(f"{self.expect}: cannot read {line!r}")
+        for block, lines in collected.items():
+            stream = block.removesuffix("-no-newline")
+            ending = "" if block != stream else "\n"
+            self.streams[stream] = ("\n".join(lines) + ending).encode()
+        self.images = {key: "\n".join(lines) for key, lines in self.images.items()}
+
+    @property
+    def status(self):
+        """The expected exit status."""
+        return int(self.keys.get("status", "0"))
+
+    @property
+    def out(self):
+        """The output file's name."""
+        return self.keys.get("out", "out.cdef")
+
+    def expected_image(self, order, native):
+        """The expected bytes and their labels, or None when none are stated."""
+        if f"image-{order}" in self.images:
+            return cdb_image.raw_hex(self.images[f"image-{order}"]), []
+        if "image" in self.images:
+            return cdb_image.assemble_labelled(self.images["image"], order, native, self.expect.parent)
+        return None
+
+
+def prepare(case, directory, program):
+    """Fill the case's directory: the program's link, the source, the set-up."""
+    (directory / "cdgen").symlink_to(program)
+    if case.source.exists():
+        (directory / case.source.name).write_bytes(case.source.read_bytes())
+    for action, *names in case.setup:
+        if action == "mkdir":
+            (directory / names[0]).mkdir()
+        elif action == "file":
+            (directory / names[0]).write_text(names[1] if len(names) > 1 else "")
+        elif action == "symlink":
+            (directory / names[1]).symlink_to(names[0])
+        elif action == "hardlink":
+            os.link(directory / names[0], directory / names[1])
+        else:
+            raise ValueError(f"{case.expect}: unknown set-up {action}")
+
+
+def snapshot(directory):
+    """Every file below a directory with its contents."""
+    return {
+        path.relative_to(directory).as_posix(): path.read_bytes() if path.is_file() else None
+        for path in sorted(directory.rglob("*"))
+        if path.name != "cdgen"
+    }
+
+
+def run(case, program, extra):
+    """Run one case; the result, the files before and the files after."""
+    if "operands" in case.keys:
+        operands = shlex.split(case.keys["operands"])
+    else:
+        operands = [case.source.name, case.out]
+    command = shlex.split(os.environ.get("CDGEN_RUNNER", ""))
+    command += ["./cdgen", *extra, *shlex.split(case.keys.get("args", "")), *operands]
+    environment = {**os.environ, "VX_CDB_FORCE_EMPTY_TIMESTAMP": "", "LC_ALL": "C"}
+    with tempfile.TemporaryDirectory() as name:
+        directory = pathlib.Path(name)
+        prepare(case, directory, program)
+        before = snapshot(directory)
+        result = subprocess.run(
+            command, cwd=directory, env=environment, stdin=subprocess.DEVNULL, capture_output=True, timeout=TIMEOUT
+        )
+        return result, before, snapshot(directory)
+
+
+def compare_stream(name, expected, actual):
+    """The difference of one output stream, as report lines."""
+    if expected == actual:
+        return []
+    return [f"{name} differs:", f"  expected {expected!r}", f"  actual   {actual!r}"]
+
+
+def compare_stderr(case, actual):
+    """The difference of the error stream, or of its form when the text is free."""
+    if case.keys.get("message") == "free":
+        good = actual.endswith(b"\n") and actual.count(b"\n") == 1 and len(actual) > 1
+        return [] if good else [f"stderr is not one line: {actual!r}"]
+    return compare_stream("stderr", case.streams["stderr"], actual)
+
+
+def compare_image(expected, labels, actual):
+    """The difference of two files as hex lines, with the field's name."""
+    if expected == actual:
+        return []
+    pairs = zip(expected, actual)
+    at = next((i for i, (a, b) in enumerate(pairs) if a != b and not 4 <= i < 8), None)
+    if at is None:
+        at = 4 if len(expected) == len(actual) else min(len(expected), len(actual))
+    label = next((text for start, length, text in labels if start <= at < start + length), "no named field")
+    report = [f"file differs: {len(expected)} bytes expected, {len(actual)} written; first at {at:#x}, in {label}"]
+    left, right = cdb_image.hex_lines(expected), cdb_image.hex_lines(actual)
+    for index in range(max(len(left), len(right))):
+        one = left[index] if index < len(left) else ""
+        two = right[index] if index < len(right) else ""
+        if one != two:
+            report += [f"  expected {one}", f"  actual   {two}"]
+    return report[:REPORT_LINES]
+
+
+def compare_files(case, before, after):
+    """What a run may leave behind: one new file, or on failure nothing."""
+    after = dict(after)
+    before = dict(before)
+    if case.status == 0:
+        before.pop(case.out, None)
+        if after.pop(case.out, None) is None:
+            return [f"no output file {case.out}"]
+    if before != after:
+        changed = sorted(name for name in before.keys() | after.keys() if before.get(name, 0) != after.get(name, 0))
+        return [f"files changed or left behind: {', '.join(changed)}"]
+    return []
+
+
+def check_run(case, program, extra, order, native):
+    """One run of a case against its expectation; problems and the file."""
+    result, before, after = run(case, program, extra)
+    problems = []
+    if result.returncode != case.status:
+        problems.append(f"exit status {result.returncode}, expected {case.status}")
+    problems += compare_stream("stdout", case.streams["stdout"], result.stdout)
+    problems += compare_stderr(case, result.stderr)
+    problems += compare_files(case, before, after)
+    written = after.get(case.out) if case.status == 0 else None
+    expected = case.expected_image(order, native)
+    if written is not None and expected:
+        problems += compare_image(*expected, written)
+    return problems, written
+
+
+def check_case(case, options):
+    """Every run that a case needs; its problems."""
+    native = options.native
+    problems, written = check_run(case, options.cdgen, [], native, native)
+    if options.swap and case.status == 0 and written is not None:
+        more, reversed_file = check_run(case, options.cdgen, ["-s"], cdb_image.other(native), native)
+        problems += [f"with -s: {line}" for line in more]
+        turned = reverse_cdb.reverse(written)
+        if reversed_file is not None and turned != reversed_file:
+            problems += [f"with -s, against reverse_cdb: {line}" for line in compare_image(turned, [], reversed_file)]
+    return problems
+
+
+def check_notation(case):
+    """Assemble a case's image in every order, and reverse what it gives."""
+    problems = []
+    if bool(case.images) and case.status != 0:
+        problems.append("an image for a run that fails")
+    if "operands" not in case.keys and not case.source.exists():
+        problems.append("no source and no operands")
+    for native in ("little", "big"):
+        try:
+            plain = case.expected_image(native, native)
+            turned = case.expected_image(cdb_image.other(native), native)
+        except cdb_image.NotationError as problem:
+            return problems + [str(problem)]
+        if plain and turned:
+            problems += compare_image(turned[0], turned[1], reverse_cdb.reverse(plain[0]))
+    return problems
+
+
+def cases_of(paths):
+    """The cases named on the command line, or below its directories."""
+    for path in map(pathlib.Path, paths):
+        if path.is_dir():
+            found = {item.with_suffix(".expect") for item in path.rglob("*") if re.search(r"\.(expect|cdefsrc)$", item.name)}
+            yield from sorted(found)
+        else:
+            yield path
+
+
+def main():
+    """Run the cases and print the count."""
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--cdgen", type=lambda text: pathlib.Path(text).resolve(), help="the program to run")
+    parser.add_argument("--swap", action="store_true", help="check option -s on every case that compiles")
+    parser.add_argument("--native", choices=("little", "big"), default="little", help="byte order of the program")
+    parser.add_argument("--keep-going", action="store_true", help="do not stop at the first failure")
+    parser.add_argument("--check-notation", action="store_true", help="only assemble the cases' images")
+    parser.add_argument("cases", nargs="+")
+    options = parser.parse_args()
+    if not options.check_notation and not options.cdgen:
+        parser.error("--cdgen PATH is needed")
+    passed = failed = 0
+    for path in cases_of(options.cases):
+        try:
+            case = Case(path)
+            problems = check_notation(case) if options.check_notation else check_case(case, options)
+        except (OSError, ValueError, KeyError, cdb_image.NotationError, subprocess.TimeoutExpired) as problem:
+            problems = [repr(problem)]
+        passed, failed = passed + (not problems), failed + bool(problems)
+        if problems:
+            print(f"FAIL {path}", *problems, sep="\n    ")
+            if not options.keep_going:
+                break
+    print(f"{passed} passed, {failed} failed")
+    return 1 if failed else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())

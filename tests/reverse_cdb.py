@@ -1,0 +1,232 @@
+"""Reverse the byte order of a finished database, field by field.
+
+A second, small statement of the reversal rules, used to check what the
+compiler's option -s writes: reading the native file and turning it here must
+give the same bytes.  References are followed while everything is still native;
+a list, a definition or a value reached twice is turned once; a reference that
+does not lead into its own table, whole, is not followed.
+"""
+
+import struct
+import sys
+
+NONE = 0xFFFFFFFF
+CLASS, MANAGER, MAP, VARCLASS, HASH = 5, 3, 6, 4, 7
+
+
+class Reverser:
+    """One reversal: the native bytes that are read, the copy that is turned."""
+
+    def __init__(self, image):
+        self.native = image
+        self.out = bytearray(image)
+        self.mark = "<" if image[8:12] == b"1tmf" else ">"
+        self.seen = set()
+
+    def get(self, at, width=4):
+        """A native number."""
+        return struct.unpack_from(self.mark + {2: "H", 4: "I"}[width], self.native, at)[0]
+
+    def turn(self, width, *places):
+        """Reverse the bytes of each field of one width."""
+        for at in places:
+            self.out[at:at + width] = self.native[at:at + width][::-1]
+
+    def table(self, record, offset, size):
+        """Start and end of a side table."""
+        start = record + self.get(record + offset)
+        return start, start + size
+
+    def target(self, table, offset, header, entry):
+        """Where a reference leads, once, if the item fits its table; or None.
+
+        The count that sizes the item is its word at byte 4 for lists (header
+        8, count second) and at byte 0 for values, told by the entry's sign.
+        """
+        if offset == NONE:
+            return None
+        at = table[0] + offset
+        if at + header > table[1]:
+            return None
+        count = self.get(at) if entry < 0 else self.get(at + 4)
+        if at + header + abs(entry) * count > table[1] or at in self.seen:
+            return None
+        self.seen.add(at)
+        return at, count
+
+    def value(self, at, kind, strings):
+        """A value cell and what it refers to."""
+        offset = self.get(at)
+        if kind in (2, 3, 6):
+            self.turn(4, at)
+        elif kind in (4, 5, 7):
+            self.turn(8, at)
+        elif kind in (8, 10):
+            self.turn(4, at)
+        elif kind == 9:
+            place = strings[0] + offset
+            if offset != NONE and place + 4 <= strings[1]:
+                self.turn(4, place)
+            self.turn(4, at)
+        elif kind == 11:
+            found = self.target(strings, offset, 8, -16)
+            if found:
+                for element in range(found[0] + 8, found[0] + 8 + 16 * found[1], 16):
+                    self.value(element + 8, self.get(element), strings)
+                    self.turn(4, element)
+                self.turn(4, found[0])
+            self.turn(4, at)
+        elif 13 <= kind <= 22:
+            found = self.target(strings, offset, 8, -8)
+            if found:
+                for element in range(found[0] + 8, found[0] + 8 + 8 * found[1], 8):
+                    self.value(element, kind - 11, strings)
+                self.turn(4, found[0])
+            self.turn(4, at)
+
+    def variety(self, offset, tables):
+        """A variety list."""
+        found = self.target(tables["vl"], offset, 8, 8)
+        if found:
+            at, count = found
+            self.turn(4, *range(at, at + 8 + 8 * count, 4))
+
+    def valid(self, offset, kind, tables):
+        """A valid-values list, its bounds turned as the element type."""
+        found = self.target(tables["vv"], offset, 8, 24)
+        if found:
+            at, count = found
+            kind = kind - 11 if 13 <= kind <= 22 else kind
+            for entry in range(at + 8, at + 8 + 24 * count, 24):
+                self.value(entry, kind, tables["strings"])
+                self.value(entry + 8, kind, tables["strings"])
+                self.turn(2, entry + 16)
+            self.turn(4, at, at + 4)
+
+    def definition(self, offset, tables):
+        """A structured-data definition and the valid values of its fields."""
+        found = self.target(tables["sd"], offset, 8, 32)
+        if found:
+            at, count = found
+            for field in range(at + 8, at + 8 + 32 * count, 32):
+                self.valid(self.get(field + 16), self.get(field + 8), tables)
+                self.turn(4, field, field + 8, field + 16, field + 24)
+                self.turn(2, field + 12, field + 14, field + 28)
+            self.turn(4, at, at + 4)
+
+    def pattr(self, at, tables):
+        """A persistent attribute."""
+        kind = self.get(at + 36)
+        self.variety(self.get(at + 40), tables)
+        self.valid(self.get(at + 48), kind, tables)
+        self.definition(self.get(at + 56), tables)
+        self.value(at + 24, kind, tables["strings"])
+        self.turn(4, at, at + 4, at + 8, at + 32, at + 36, at + 40, at + 48, at + 56)
+        self.turn(2, at + 16, at + 18, at + 20, at + 22, at + 64)
+
+    def dattr(self, at, tables):
+        """A dynamic attribute; its reporting interval stays as it is."""
+        kind = self.get(at + 104)
+        self.variety(self.get(at + 56), tables)
+        self.valid(self.get(at + 64), kind, tables)
+        self.definition(self.get(at + 72), tables)
+        for place in (32, 40, 48):
+            self.value(at + place, kind, tables["strings"])
+        self.turn(4, at, at + 4, *(at + place for place in (8, 16, 24, 56, 64, 72, 80, 88, 96, 104, 108, 120)))
+        self.turn(2, *(at + place for place in (112, 114, 116, 118, 124, 126, 128, 130)))
+
+    def action(self, at, tables):
+        """An action with its input and response definitions."""
+        self.variety(self.get(at + 32), tables)
+        self.definition(self.get(at + 40), tables)
+        self.definition(self.get(at + 48), tables)
+        self.turn(4, at, at + 4, at + 8, at + 20, at + 24, at + 32, at + 40, at + 48)
+        self.turn(2, at + 12, at + 14, at + 16, at + 18)
+
+    def error(self, at, tables):
+        """An error record."""
+        self.variety(self.get(at + 24), tables)
+        self.definition(self.get(at + 32), tables)
+        self.turn(4, at, at + 4, at + 8, at + 16, at + 24, at + 32, at + 40)
+        self.turn(2, at + 12, at + 14)
+
+    def depend(self, at, _tables):
+        """A dependency record."""
+        self.turn(4, at)
+        self.turn(2, at + 4)
+
+    def records(self, at, offset, count, size, routine, tables):
+        """Every record of one of a class's tables."""
+        start = self.get(at + offset)
+        if start != NONE:
+            for index in range(self.get(at + count, 2)):
+                routine(at + start + index * size, tables)
+
+    def class_section(self, at, length):
+        """A class: its tables in walking order, then its own record."""
+        tables = {
+            "strings": (at + self.get(at + 160), at + length),
+            "vv": self.table(at, 152, self.get(at + 196)),
+            "vl": self.table(at, 128, self.get(at + 184)),
+            "sd": self.table(at, 144, self.get(at + 192)),
+        }
+        self.records(at, 24, 168, 72, self.pattr, tables)
+        self.records(at, 32, 170, 136, self.dattr, tables)
+        self.records(at, 40, 172, 72, self.pattr, tables)
+        self.records(at, 48, 174, 136, self.dattr, tables)
+        for place in (56, 64, 72, 80, 88):
+            self.definition(self.get(at + place), tables)
+        self.records(at, 96, 176, 56, self.action, tables)
+        self.records(at, 104, 178, 56, self.action, tables)
+        self.records(at, 112, 180, 48, self.error, tables)
+        self.records(at, 120, 182, 8, self.depend, tables)
+        self.turn(4, at, at + 4, *range(at + 8, at + 168, 8), *range(at + 184, at + 208, 4), at + 216)
+        self.turn(2, *range(at + 168, at + 184, 2), *range(at + 208, at + 216, 2))
+
+    def section(self, kind, at, length):
+        """One data section."""
+        if kind == CLASS:
+            self.class_section(at, length)
+        elif kind == MANAGER:
+            self.turn(4, at, at + 8)
+            self.turn(2, at + 4, at + 6)
+        elif kind == VARCLASS:
+            ids = at + 40 + self.get(at + 28)
+            self.turn(4, *range(ids, ids + 4 * self.get(at + 24), 4))
+            self.turn(4, at, at + 8, at + 16, at + 24, at + 28)
+            self.turn(2, at + 4, at + 6)
+        elif kind == MAP:
+            self.turn(4, at, at + 8, at + 16, *range(at + 40, at + 56, 4))
+            self.turn(2, at + 4, at + 6, *range(at + 24, at + 40, 2))
+        elif kind == HASH:
+            for block in range(at + 8200, at + 8200 + 24 * self.get(at + 8196), 24):
+                self.turn(4, block, block + 8, block + 12, block + 16)
+            self.turn(4, at, at + 8196)
+
+    def whole(self):
+        """The whole file: sections, anchors, header, a fresh checksum."""
+        for anchor in range(80, 80 + 16 * self.get(24), 16):
+            kind, at, length = (self.get(anchor + place) for place in (0, 4, 8))
+            self.section(kind, at, length)
+            self.turn(4, *range(anchor, anchor + 16, 4))
+        self.turn(4, 0, 8, 12, 16, 20, 24)
+        self.turn(2, *range(28, 50, 2))
+        turned = ">" if self.mark == "<" else "<"
+        words = (self.get(0) - 4) // 4
+        value = struct.unpack_from(turned + "I", self.out, 0)[0]
+        for word in struct.unpack_from(turned + f"{words}I", self.out, 8):
+            value ^= word
+        struct.pack_into(turned + "I", self.out, 4, value)
+        return bytes(self.out)
+
+
+def reverse(image):
+    """A native image in the other byte order."""
+    return Reverser(image).whole()
+
+
+if __name__ == "__main__":
+    with open(sys.argv[1], "rb") as source:
+        result = reverse(source.read())
+    with open(sys.argv[2], "wb") as target:
+        target.write(result)

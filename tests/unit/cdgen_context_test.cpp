@@ -1,0 +1,58 @@
+/* A second compilation in the same process starts clean. */
+
+#include "cdgen.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdio>
+#include <filesystem>
+#include <fstream>
+#include <string>
+
+namespace {
+
+std::string contents(const std::filesystem::path &path) {
+    std::ifstream in(path, std::ios::binary);
+    return {std::istreambuf_iterator<char>(in), {}};
+}
+
+class Context : public testing::Test {
+protected:
+    void SetUp() override {
+        directory = std::filesystem::temp_directory_path() / ("cdgen-context-" + std::to_string(getpid()));
+        std::filesystem::create_directory(directory);
+        setenv("VX_CDB_FORCE_EMPTY_TIMESTAMP", "", 1);
+    }
+    void TearDown() override {
+        std::filesystem::remove_all(directory);
+    }
+
+    int run(const std::string &text, const std::string &output) {
+        std::string source = directory / "case.cdefsrc";
+        std::ofstream(source) << text;
+        std::string out = directory / output;
+        std::string program = "cdgen";
+        char *argv[] = {program.data(), source.data(), out.data(), nullptr};
+        return cdgen_main(3, argv);
+    }
+
+    std::filesystem::path directory;
+};
+
+const std::string minimal =
+    "ControlDefinition\n\tFileVersion=1.0.0.0\nResourceClass\n\tDescription=1\n\tDisplayName=2\n"
+    "\tProperties=HasResources,CanDefine\n\tClassPermTemplate=0\n\tResourcePermTemplate=0\n"
+    "\tName=Small\n"
+    "ClassToManagerMapping\n\tResourceManager=Mgr1\n\tFirstKey=1\n\tLastKey=100\n"
+    "\tMessageCatalog=mgr1.cat\n\tDescriptiveMessageSet=1\n";
+
+TEST_F(Context, SecondCompilationIsLikeTheFirst) {
+    ASSERT_EQ(run(minimal, "first.cdef"), 0);
+    ASSERT_EQ(run("Nonsense\n", "wrong.cdef"), 1);
+    ASSERT_EQ(run(minimal, "second.cdef"), 0);
+    EXPECT_FALSE(contents(directory / "first.cdef").empty());
+    EXPECT_EQ(contents(directory / "first.cdef"), contents(directory / "second.cdef"));
+    EXPECT_FALSE(std::filesystem::exists(directory / "wrong.cdef"));
+}
+
+} // namespace

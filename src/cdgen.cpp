@@ -13,9 +13,6 @@ namespace {
 
 constexpr vx_uint16_t NO_LOCATOR = 0xFFFF;
 
-/* A complaint of getopt's own: nothing else is to be printed. */
-constexpr fatal_exit OPTION_REFUSED = {nullptr, nullptr, nullptr, 0, 1};
-
 void parse_options(cdgen &cx, int argc, char **argv) {
     optind = 1;
     for (int option = 0; (option = getopt(argc, argv, "nd:s")) != -1;) {
@@ -29,8 +26,8 @@ void parse_options(cdgen &cx, int argc, char **argv) {
         case 's':
             cx.swap_endianness = 1;
             break;
-        default:
-            throw OPTION_REFUSED;
+        default: /* getopt has complained: nothing else is to be printed */
+            throw fatal_exit{nullptr, nullptr, nullptr, 0, 1};
         }
     }
 }

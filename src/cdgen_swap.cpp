@@ -55,13 +55,12 @@ void swap_fields(char *record, std::span<const field> fields) {
     for (const field &f : fields) {
         if (f.stays)
             continue;
+        bool reference = f.kind == field_kind::reference;
+        if (!reference && f.kind != field_kind::number)
+            continue;
         char *at = record + f.offset;
-        if (f.kind == field_kind::reference)
-            for (int i = 0; i < f.count; ++i)
-                swap_word(at + i * f.width);
-        if (f.kind == field_kind::number)
-            for (int i = 0; i < f.count; ++i)
-                swap_any(at + i * f.width, f.width);
+        for (size_t i = 0; i < f.count; ++i, at += f.width)
+            swap_any(at, reference ? sizeof(vx_uint32_t) : f.width);
     }
 }
 
@@ -311,7 +310,7 @@ char *swap_area::take(vx_uint32_t offset, size_t head, size_t count_at, size_t e
     return base + offset;
 }
 
-void swap_any(char *field, int width) {
+void swap_any(char *field, size_t width) {
     if (width == 2 || width == 4 || width == 8)
         std::reverse(field, field + width);
 }

@@ -28,7 +28,7 @@ private:
 };
 
 /* The reversal of a field of 2, 4 or 8 bytes; other widths are left alone. */
-void swap_any(char *field, int width);
+void swap_any(char *field, size_t width);
 
 /* The cell and, where sbase_p has it, the out-of-line value. */
 void swap_value(char *value, vx_data_type_t type, swap_area &sbase_p);

@@ -130,6 +130,8 @@ int encode(vx_value_t &cell, const encoding &e) {
         return -1;
     if (e.type == VX_NONE)
         return 0;
+    if (e.in == nullptr && e.mode <= TYPE_16) /* nothing to copy */
+        return -1;
     return e.type == VX_CHAR_PTR || e.type == VX_BINARY_PTR ? encode_text(cell, e) : encode_number(cell, e);
 }
 

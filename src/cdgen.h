@@ -6,6 +6,7 @@
 #define CDGEN_CDGEN_H
 
 #include "cdb.h"
+#include "name_index.h"
 
 #include <array>
 #include <cstddef>
@@ -16,6 +17,7 @@
 #include <memory>
 #include <optional>
 #include <span>
+#include <string_view>
 #include <sys/types.h>
 
 struct cdgen;
@@ -303,6 +305,7 @@ struct srtable_ctrl {
     const char *sc_name;
     void *(*sc_cb)(cdgen &);
     std::span<const table_attrs> sc_attrs;
+    name_index sc_attr_names; /* of sc_attrs */
     void (*sc_init_tbl)(cdgen &);
     vx_uint32_t req_mask_cmplt; /* what req_mask is when every required attribute has been seen */
     tbl *(*sc_str_tbl)(cdgen &);
@@ -322,6 +325,8 @@ extern const int num_perm_list;
 
 /* The index of a stanza kind by its exact name, or -1. */
 int set_table_id(const char *name);
+/* A kind's attribute by its exact name, or null. */
+const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name);
 /* Non-null when the kind's name says that it defines structured data; that of an attribute. */
 const char *is_SD_stanza(int table_id);
 const char *is_attr_SD(int table_id);

@@ -8,21 +8,24 @@ namespace {
 
 constexpr size_t VALUE_MAX_CHARS = LOCATOR_SIZE - 1;
 
-/* The name and value of a line; a null name when there is nothing to store. */
+/* The name and value of a line, the name ended by a NUL; no value when there is nothing to store. */
 struct name_value {
-    const char *name;
+    std::string_view name;
     char *value;
 };
 
 name_value split_line(cdgen &cx, char *il) {
-    char *name = il + strspn(il, " \t");
+    char *name = il;
+    while (*name == ' ' || *name == '\t')
+        ++name;
     cx.linepos = 1 + static_cast<int>(name - il);
     if (*name == '\0')
         return {};
-    char *value = strchr(name, '=');
-    if (value == nullptr)
+    char *equals = strchr(name, '=');
+    if (equals == nullptr)
         source_error(cx, "Missing '=' after attribute name");
-    *value++ = '\0';
+    *equals = '\0';
+    char *value = equals + 1;
     if (strcmp(value, "\"\"") == 0)
         return {};
     char *unquoted = strip_quotes(value);
@@ -31,14 +34,14 @@ name_value split_line(cdgen &cx, char *il) {
     if (strlen(unquoted) > VALUE_MAX_CHARS)
         source_error(cx, "Attibute value exceeds maximum length: ", name); /* deliberately spelled so */
     cx.linepos = 1 + static_cast<int>(unquoted - il);
-    return {name, unquoted};
+    return {{name, static_cast<size_t>(equals - name)}, unquoted};
 }
 
-const table_attrs &find_attr(cdgen &cx, const srtable_ctrl &scp, const char *name) {
-    for (const table_attrs &attr : scp.sc_attrs)
-        if (strcmp(attr.ta_name, name) == 0)
-            return attr;
-    source_error(cx, "Attribute name not defined in table (name/table): ", name, scp.sc_name);
+const table_attrs &known_attr(cdgen &cx, const srtable_ctrl &scp, std::string_view name) {
+    const table_attrs *attr = find_attr(scp, name);
+    if (attr == nullptr)
+        source_error(cx, "Attribute name not defined in table (name/table): ", name.data(), scp.sc_name);
+    return *attr;
 }
 
 /* Optional attributes follow the required ones; most may stand once. */
@@ -63,17 +66,17 @@ void count_required(cdgen &cx, stanza_state &state, const table_attrs &attr) {
 
 void save_attr(cdgen &cx, char *il, int table_id) {
     auto [name, value] = split_line(cx, il);
-    if (name == nullptr)
+    if (value == nullptr)
         return;
     const srtable_ctrl &scp = sc_tables[static_cast<size_t>(table_id)];
     stanza_state &state = cx.stanzas[static_cast<size_t>(table_id)];
-    const table_attrs &attr = find_attr(cx, scp, name);
+    const table_attrs &attr = known_attr(cx, scp, name);
     if (*value == '\0') {
         printf("In file %s: ", cx.cdefsrc);
-        source_error(cx, "Missing attribute value: ", name);
+        source_error(cx, "Missing attribute value: ", attr.ta_name);
     }
     if (cx.debugLevel >= 2)
-        printf("%s: found attr: \"%s\", value: \"%s\",length: %d\n", scp.sc_name, name, value,
+        printf("%s: found attr: \"%s\", value: \"%s\",length: %d\n", scp.sc_name, attr.ta_name, value,
                static_cast<int>(strlen(value)));
     if ((attr.req_bit & OPTIONAL) != 0)
         count_optional(cx, scp, state, attr);

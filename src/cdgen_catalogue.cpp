@@ -151,6 +151,10 @@ constexpr sd_owner reset_owner = {SD_TYPE_RESET, &rsrc_class_t::u_rc_reset_input
 constexpr sd_owner action_in_owner = {SD_TYPE_ACT_IN, nullptr, &rsrc_action_t::u_ac_sd_input};
 constexpr sd_owner action_out_owner = {SD_TYPE_ACT_RESP, nullptr, &rsrc_action_t::u_ac_sd_resp};
 
+template <std::size_t Count> consteval name_index names_of(const table_attrs (&attrs)[Count]) {
+    return {Count, [&](std::size_t i) { return std::string_view(attrs[i].ta_name); }};
+}
+
 template <auto Record> void *record(cdgen &cx) {
     return &(cx.*Record);
 }
@@ -173,12 +177,13 @@ constexpr auto variable_class_strings =
     &table<&cdgen::cb_rsrc_variable_class, &rsrc_variable_class_t::u_rvc_string_tbl>;
 
 /* A kind that stores into the open class's tables: all but two. */
-template <auto Record>
-constexpr srtable_ctrl of_class(const char *name, std::span<const table_attrs> attrs, void (*init)(cdgen &),
+template <auto Record, std::size_t Count>
+consteval srtable_ctrl of_class(const char *name, const table_attrs (&attrs)[Count], void (*init)(cdgen &),
                                 int dt_offset = -1, const attr_kind *kind = nullptr, const sd_owner *owner = nullptr) {
     return {.sc_name = name,
             .sc_cb = record<Record>,
             .sc_attrs = attrs,
+            .sc_attr_names = names_of(attrs),
             .sc_init_tbl = init,
             .req_mask_cmplt = required_mask(attrs),
             .sc_str_tbl = class_strings,
@@ -190,7 +195,7 @@ constexpr srtable_ctrl of_class(const char *name, std::span<const table_attrs> a
             .sc_sd_owner = owner};
 }
 
-constexpr srtable_ctrl sd_stanza(const char *name, const sd_owner &owner,
+consteval srtable_ctrl sd_stanza(const char *name, const sd_owner &owner,
                                  vx_uint32_t complete = required_mask(sd_attrs)) {
     srtable_ctrl row = of_class<&cdgen::cb_sd_def>(name, sd_attrs, init_sd_tbl,
                                                    offsetof(sd_def_t, sd_fields) + offsetof(sd_field_t, sd_field_type),
@@ -207,6 +212,7 @@ constexpr std::array<srtable_ctrl, SC_COUNT + 1> catalogue = {{
     {.sc_name = "ClassToManagerMapping",
      .sc_cb = record<&cdgen::cb_rsrc_cmmap>,
      .sc_attrs = cmmap_attrs,
+     .sc_attr_names = names_of(cmmap_attrs),
      .sc_init_tbl = init_cmmap_tbl,
      .req_mask_cmplt = required_mask(cmmap_attrs),
      .sc_str_tbl = cmmap_strings,
@@ -219,6 +225,7 @@ constexpr std::array<srtable_ctrl, SC_COUNT + 1> catalogue = {{
     {.sc_name = "ResourceVariableClass",
      .sc_cb = record<&cdgen::cb_rsrc_variable_class>,
      .sc_attrs = variable_class_attrs,
+     .sc_attr_names = names_of(variable_class_attrs),
      .sc_init_tbl = init_var_class_tbl,
      .req_mask_cmplt = required_mask(variable_class_attrs),
      .sc_str_tbl = variable_class_strings,
@@ -249,6 +256,8 @@ constexpr std::array<srtable_ctrl, SC_COUNT + 1> catalogue = {{
     {},
 }};
 
+constexpr name_index stanza_names(SC_COUNT, [](std::size_t i) { return std::string_view(catalogue[i].sc_name); });
+
 /* The stanzas that the assembly reaches by index instead of by name. */
 constexpr bool named(stanza_id id, std::string_view name) {
     return catalogue[id].sc_name == name;
@@ -267,6 +276,19 @@ static_assert(named(SC_CLASS_ACTION, "ClassAction"), "Class Action table not fou
 } // namespace
 
 constinit const std::array<srtable_ctrl, SC_COUNT + 1> sc_tables = catalogue;
+
+int set_table_id(const char *name) {
+    int id = stanza_names.candidate(name);
+    return id >= 0 && strcmp(sc_tables[static_cast<size_t>(id)].sc_name, name) == 0 ? id : -1;
+}
+
+const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name) {
+    int at = scp.sc_attr_names.candidate(name);
+    if (at < 0)
+        return nullptr;
+    const table_attrs &attr = scp.sc_attrs[static_cast<size_t>(at)];
+    return name == attr.ta_name ? &attr : nullptr;
+}
 
 const props_t rc_props[] = {
     {"MtypDivided", 0x2000},     {"MtypCentral", 0x4000},     {"MtypGlobal", 0x8000},  {"ORBElectCoord", 0x100},

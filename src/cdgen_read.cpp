@@ -59,36 +59,53 @@ bool read_line(cdgen &cx) {
     return length > 0;
 }
 
+/* What a character means to the search for a line's end; most mean nothing but that there is text. */
+enum char_class : char { TEXT, BLANK, QUOTE, HASH, SLASH, END };
+
+constexpr std::array<char_class, 256> char_classes = [] {
+    std::array<char_class, 256> classes = {};
+    classes['\0'] = classes['\n'] = END;
+    classes[' '] = classes['\t'] = BLANK;
+    classes['"'] = QUOTE;
+    classes['#'] = HASH;
+    classes['/'] = SLASH;
+    return classes;
+}();
+
+char_class class_of(char c) {
+    return char_classes[static_cast<unsigned char>(c)];
+}
+
 /* Where the text of a line ends: at its newline, its comment, or its NUL. Null for a line without text: blanks, quotes
  * and comments are none. */
 char *end_of_text(char *line) {
     bool text_seen = false;
     bool quoted = false;
     for (char *p = line;; ++p) {
-        switch (*p) {
-        case '\0':
-        case '\n':
+        switch (class_of(*p)) {
+        case END:
             return text_seen ? p : nullptr;
-        case ' ':
-        case '\t':
+        case BLANK:
             break;
-        case '"':
+        case QUOTE:
             quoted = !quoted;
             break;
-        case '#':
+        case HASH:
             if (!text_seen)
                 return nullptr;
             if (!quoted)
                 return p;
             break;
-        case '/':
+        case SLASH:
             if (p[1] != '/' && p[1] != '*')
                 text_seen = true;
             else if (!quoted)
                 return text_seen ? p : nullptr;
             break;
-        default:
+        case TEXT:
             text_seen = true;
+            while (class_of(p[1]) == TEXT)
+                ++p;
         }
     }
 }
@@ -221,13 +238,6 @@ void cache_input_data(cdgen &cx, const char *filename) {
             save_attr(cx, cx.inbuf, cx.table_id);
     }
     cx.cdb_fp.close();
-}
-
-int set_table_id(const char *name) {
-    for (int id = 0; sc_tables[static_cast<size_t>(id)].sc_name != nullptr; ++id)
-        if (strcmp(sc_tables[static_cast<size_t>(id)].sc_name, name) == 0)
-            return id;
-    return -1;
 }
 
 const char *is_SD_stanza(int table_id) {

@@ -43,6 +43,8 @@ constexpr vx_data_type_t vxTypeMap[] = {
 };
 static_assert(std::size(vxTypeStr) == std::size(vxTypeMap));
 
+constexpr name_index type_names(std::size(vxTypeStr), [](size_t i) { return std::string_view(vxTypeStr[i]); });
+
 constexpr const char *vxVarStr[] = {"Counter", "Quantity", "State", "Quantum"};
 constexpr orb_variable_type_t vxVarMap[] = {ORB_COUNTER, ORB_QUANTITY, ORB_STATE, ORB_QUANTUM};
 static_assert(std::size(vxVarStr) == std::size(vxVarMap));
@@ -220,11 +222,8 @@ void store_length(char *block, size_t length) {
 } // namespace
 
 vx_data_type_t strToVxDt(const char *s) {
-    if (s != nullptr)
-        for (size_t i = 0; i < std::size(vxTypeStr); ++i)
-            if (strcmp(s, vxTypeStr[i]) == 0)
-                return vxTypeMap[i];
-    return VX_UNKNOWN;
+    int at = s == nullptr ? -1 : type_names.candidate(s);
+    return at >= 0 && strcmp(s, vxTypeStr[at]) == 0 ? vxTypeMap[at] : VX_UNKNOWN;
 }
 
 int strToVar(const char *s, orb_variable_type_t *t) {
@@ -305,7 +304,9 @@ int oct_convert(cdgen &cx, const char *p, int type, char *out_buf) {
 char *strip_quotes(char *s) {
     if (s == nullptr)
         return nullptr;
-    char *open = s + strspn(s, " \t");
+    char *open = s;
+    while (*open == ' ' || *open == '\t')
+        ++open;
     if (*open != '"')
         return s;
     char *close = open + strlen(open) - 1;

@@ -14,7 +14,7 @@ namespace {
 constexpr vx_uint16_t NO_LOCATOR = 0xFFFF;
 
 void parse_options(cdgen &cx, int argc, char **argv) {
-    optind = 1;
+    optind = 0; /* forget an earlier command line of this process altogether */
     for (int option = 0; (option = getopt(argc, argv, "nd:s")) != -1;) {
         switch (option) {
         case 'n':

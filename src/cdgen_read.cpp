@@ -227,7 +227,7 @@ void cache_input_data(cdgen &cx, const char *filename) {
     open_source(cx, filename);
     cx.table_id = -1;
     while (read_line(cx)) {
-        ++cx.linenum;
+        cx.linenum = static_cast<int>(static_cast<unsigned>(cx.linenum) + 1); /* may wrap, in a source of gigabytes */
         if (!strip_line(cx.inbuf))
             continue;
         if (cx.inbuf[0] != ' ' && cx.inbuf[0] != '\t')

@@ -13,6 +13,7 @@
 typedef vx_uint16_t cdb_uint16_t;
 typedef vx_uint32_t cdb_uint32_t;
 typedef vx_int32_t cdb_int32_t;
+typedef vx_resource_class_id_t orb_resource_class_id_t;
 
 /* A reference. In a file the first word is the offset, from the base that the field's comment names, and the second is
  * to be ignored; CDB_NONE in the first word means that there is nothing to refer to. The bytes are room for a pointer,
@@ -43,7 +44,7 @@ VX_ASSERT_SIZE(cdb_ref_t, 8);
 #define CDB_ID_VARIETY_LIST CDB_ID('g')
 
 /* What a data section holds; 0 to 2 are not used and 7 is never written. Stored as 32 bits. */
-typedef enum cdb_dsect_type {
+typedef enum cdb_dsect_type VX_ENUM_32 {
     CDB_DSECT_UNUSED = 0,
     CDB_DSECT_EMPTY = 1,
     CDB_DSECT_TBL_CNTRS = 2,
@@ -157,18 +158,18 @@ typedef struct rsrc_class {
     cdb_uint16_t rc_num_actions;
     cdb_uint16_t rc_num_errors;
     cdb_uint16_t rc_num_depends;
-    cdb_uint32_t rc_varlist_size; /* bytes of the variety-list table */
-    cdb_uint32_t rc_sbs_size;     /* 0 */
-    cdb_uint32_t rc_sd_size;      /* bytes of the SD-definition table */
-    cdb_uint32_t rc_valval_size;  /* bytes of the valid-values table */
-    cdb_uint32_t rc_perm_temp;    /* resource permission bits */
-    cdb_uint32_t rc_perm_tempC;   /* class permission bits */
-    cdb_uint16_t rc_class_id;     /* class number */
-    cdb_uint16_t rc_dscr_msgid;   /* message number of the description */
-    cdb_uint16_t rc_disp_msgid;   /* message number of the display name */
-    cdb_uint16_t rc_locator;      /* ID of the persistent attribute that locates a resource; 0xFFFF: none */
-    cdb_uint32_t rc_version;      /* a.b.c.d: a << 24 | b << 16 | c << 8 | d */
-    cdb_uint16_t rc_spare[2];     /* 0 */
+    cdb_uint32_t rc_varlist_size;        /* bytes of the variety-list table */
+    cdb_uint32_t rc_sbs_size;            /* 0 */
+    cdb_uint32_t rc_sd_size;             /* bytes of the SD-definition table */
+    cdb_uint32_t rc_valval_size;         /* bytes of the valid-values table */
+    cdb_uint32_t rc_perm_temp;           /* resource permission bits */
+    cdb_uint32_t rc_perm_tempC;          /* class permission bits */
+    orb_resource_class_id_t rc_class_id; /* class number */
+    cdb_uint16_t rc_dscr_msgid;          /* message number of the description */
+    cdb_uint16_t rc_disp_msgid;          /* message number of the display name */
+    cdb_uint16_t rc_locator;             /* ID of the persistent attribute that locates a resource; 0xFFFF: none */
+    cdb_uint32_t rc_version;             /* a.b.c.d: a << 24 | b << 16 | c << 8 | d */
+    cdb_uint16_t rc_spare[2];            /* 0 */
 } rsrc_class_t;
 VX_ASSERT_SIZE(rsrc_class_t, 224);
 VX_ASSERT_OFFSET(rsrc_class_t, rc_cb_ID, 0);
@@ -365,7 +366,7 @@ VX_ASSERT_OFFSET(rsrc_error_t, re_reserved, 44);
 /* A dependency on another class; defined for readers, never written. */
 typedef struct rsrc_depend {
     cdb_uint32_t rd_cb_ID;
-    cdb_uint16_t rd_class_ID;
+    orb_resource_class_id_t rd_class_ID;
     cdb_uint16_t rd_reserved; /* 0 */
 } rsrc_depend_t;
 VX_ASSERT_SIZE(rsrc_depend_t, 8);
@@ -497,12 +498,12 @@ VX_ASSERT_OFFSET(rsrc_mgr_t, u_rm_strings_table, 16);
 /* A class-to-manager map. Its string table follows. 60 bytes: each map section shifts what follows by 4 against an
  * 8-byte boundary. */
 typedef struct rsrc_cmmap {
-    cdb_uint32_t rcm_cb_ID;        /* CDB_ID_CMMAP */
-    cdb_uint16_t rcm_class_ID;     /* 0 */
-    cdb_uint16_t rcm_rm_ID;        /* rm_id of the manager */
-    cdb_ref_t u_rcm_msg_file;      /* the map's string table: message catalogue */
-    cdb_ref_t u_rcm_strings;       /* 60: where the string table stands, from this record */
-    cdb_uint16_t rcm_dscr_msg_set; /* message set of the descriptions */
+    cdb_uint32_t rcm_cb_ID;               /* CDB_ID_CMMAP */
+    orb_resource_class_id_t rcm_class_ID; /* 0 */
+    cdb_uint16_t rcm_rm_ID;               /* rm_id of the manager */
+    cdb_ref_t u_rcm_msg_file;             /* the map's string table: message catalogue */
+    cdb_ref_t u_rcm_strings;              /* 60: where the string table stands, from this record */
+    cdb_uint16_t rcm_dscr_msg_set;        /* message set of the descriptions */
     cdb_uint16_t rcm_first_key;
     cdb_uint16_t rcm_last_key;
     cdb_uint16_t rcm_asnno_start; /* this and all that follow: 0 */

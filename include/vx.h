@@ -19,6 +19,13 @@
 #define VX_ASSERT_SIZE(type, size) VX_ASSERT(sizeof(type) == (size))
 #define VX_ASSERT_OFFSET(type, field, where) VX_ASSERT(offsetof(type, field) == (where))
 
+/* Enumerations that a file holds have 32 bits, and in a file may have any value. */
+#ifdef __cplusplus
+#define VX_ENUM_32 : uint32_t
+#else
+#define VX_ENUM_32
+#endif
+
 typedef int8_t vx_int8_t;
 typedef int16_t vx_int16_t;
 typedef uint16_t vx_uint16_t;
@@ -36,7 +43,7 @@ VX_ASSERT_SIZE(vx_float64_t, 8);
 
 /* The type of a value. An array type is its element type plus 11 (Int32 to SD: 2..11, their arrays: 13..22); there is
  * no array of structured byte strings. Stored as 32 bits. */
-typedef enum vx_data_type {
+typedef enum vx_data_type VX_ENUM_32 {
     VX_UNKNOWN = 0, /* no valid type; also the result of looking up an unknown name */
     VX_NONE = 1,    /* no value */
     VX_INT32 = 2,
@@ -64,7 +71,7 @@ typedef enum vx_data_type {
 VX_ASSERT_SIZE(vx_data_type_t, 4);
 
 /* How a dynamic attribute varies. Stored as 32 bits. */
-typedef enum orb_variable_type {
+typedef enum orb_variable_type VX_ENUM_32 {
     ORB_COUNTER = 0,
     ORB_QUANTITY = 1,
     ORB_STATE = 2,

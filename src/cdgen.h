@@ -19,6 +19,7 @@
 #include <span>
 #include <string_view>
 #include <sys/types.h>
+#include <vector>
 
 struct cdgen;
 
@@ -393,6 +394,14 @@ struct _rc_locator_t {
     char name[LOCATOR_SIZE] = {};
 };
 
+/* An attribute that a new class found open, and which so refers to a valid-value list that it does not have: the last
+ * record of one of the class's tables. */
+struct listless_record {
+    int rsrc_class; /* the class's position among all */
+    cdb_ref_t rsrc_class_t::*records;
+    size_t from_end; /* bytes from the reference to the end of the table */
+};
+
 /* A variable class and the list of its variable IDs. */
 struct tbl_pair {
     const rsrc_variable_class_t *rvcp;
@@ -485,6 +494,11 @@ struct cdgen {
     int sd_dt_found = 0;
     int sd_vv_found = 0;
 
+    /* What the reversal cannot see in the image: references that look like one to the first list, and are none. */
+    std::vector<listless_record> listless; /* by class */
+    size_t listless_done = 0;              /* those whose class has been written */
+    std::vector<size_t> nowhere;           /* their places in the image, in bytes */
+
     /* Variable IDs */
     std::array<tbl_pair, TBL_ENTRIES_MAX> tbl_entries = {};
     size_t tbl_entry_used = 0;
@@ -575,8 +589,9 @@ void add_rsrc_var_class_tbls(cdgen &cx);
 /* Unmaps, closes and removes the output file if it is mapped. */
 void discard_mapfile(cdgen &cx);
 
-/* Reverses the byte order of a finished image in place. */
-void cdgen_cdef_swap(char *cdb_hdr_p);
+/* Reverses the byte order of a finished image in place. nowhere: places in the image of references that are 0 and lead
+ * nowhere; they are not followed. */
+void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere = {});
 
 /* A descriptor above the three standard ones, so that a trace on a closed stream cannot end up in it; or -1. */
 int above_stdio(int fd);

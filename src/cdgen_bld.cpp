@@ -151,7 +151,7 @@ template <class Record> void store(char *to, const Record &record) {
 void flush_mapfile(cdgen &cx) {
     auto final_size = static_cast<off_t>(load<orb_cdb_header_t>(cx.chp).cdb_hdr_length) + 4;
     if (cx.swap_endianness)
-        cdgen_cdef_swap(cx.chp);
+        cdgen_cdef_swap(cx.chp, cx.nowhere);
     munmap(std::exchange(cx.cdb_mapfile_ptr, nullptr), cx.gross_file_size);
     int fd = std::exchange(cx.cdb_mapfile_fd, 0);
     [[maybe_unused]] int truncated = ftruncate(fd, final_size);
@@ -232,6 +232,17 @@ constexpr class_side_table class_side_tables[] = {
     {&rsrc_class_t::u_rc_strings, class_side_table::ROUNDED},
 };
 
+/* The places of references that are none, once the class's tables have theirs. Classes are the first sections. */
+void note_nowhere(cdgen &cx, const rsrc_class_t &staged, const rsrc_class_t &record, const char *at) {
+    for (; cx.listless_done < cx.listless.size(); ++cx.listless_done) {
+        const listless_record &listless = cx.listless[cx.listless_done];
+        if (listless.rsrc_class != cx.dsect_idx)
+            break;
+        cx.nowhere.push_back(static_cast<size_t>(at - cx.chp) + (record.*listless.records).offset[0] +
+                             used_bytes(staged.*listless.records) - listless.from_end);
+    }
+}
+
 void add_class(cdgen &cx, const rsrc_class_t &staged) {
     section out(cx, CDB_DSECT_CLASS);
     char *at = out.write(&staged, sizeof staged);
@@ -245,6 +256,7 @@ void add_class(cdgen &cx, const rsrc_class_t &staged) {
             out.write_table(staged.*field);
     }
     store(at, record);
+    note_nowhere(cx, staged, record, at);
     out.finish();
 }
 

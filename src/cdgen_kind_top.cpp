@@ -54,12 +54,16 @@ void default_class_name(cdgen &cx) {
     cx.cb_rsrc_class.u_rc_name.offset[0] = add_to_tbl(cx, strings, name.get(), length + 1);
 }
 
-/* Deliberate: an attribute that a new class finds open goes into the old one as it is, unchecked. */
-template <class Attribute> void flush_raw(cdgen &cx, Attribute &attr, const cdb_ref_t &records) {
+/* Deliberate: an attribute that a new class finds open goes into the old one as it is, unchecked. If it has no valid
+ * values its reference to them may still be 0, which is not "none": the reversal is told. */
+template <class Attribute>
+void flush_raw(cdgen &cx, Attribute &attr, cdb_ref_t rsrc_class_t::*records, vx_uint16_t found) {
     if (attr.ra_cb_ID == 0)
         return;
-    append_record(cx, staged_tbl(records), attr);
+    append_record(cx, staged_tbl(cx.cb_rsrc_class.*records), attr);
     attr.ra_cb_ID = 0;
+    if (!found && attr.u_ra_valid_vals.offset[0] == 0)
+        cx.listless.push_back({cx.rsrc_class_count, records, sizeof(Attribute) - offsetof(Attribute, u_ra_valid_vals)});
 }
 
 } // namespace
@@ -133,10 +137,10 @@ void cmplt_class_tbl(cdgen &cx) {
     rsrc_class_t &rsrc_class = cx.cb_rsrc_class;
     if (rsrc_class.u_rc_name.offset[0] == CDB_NONE)
         default_class_name(cx);
-    flush_raw(cx, cx.cb_rsrc_pattrC, rsrc_class.u_rc_pattrsC);
-    flush_raw(cx, cx.cb_rsrc_dattrC, rsrc_class.u_rc_dattrsC);
-    flush_raw(cx, cx.cb_rsrc_pattr, rsrc_class.u_rc_pattrs);
-    flush_raw(cx, cx.cb_rsrc_dattr, rsrc_class.u_rc_dattrs);
+    flush_raw(cx, cx.cb_rsrc_pattrC, &rsrc_class_t::u_rc_pattrsC, cx.pattrC_vv_found);
+    flush_raw(cx, cx.cb_rsrc_dattrC, &rsrc_class_t::u_rc_dattrsC, cx.dattrC_vv_found);
+    flush_raw(cx, cx.cb_rsrc_pattr, &rsrc_class_t::u_rc_pattrs, cx.pattr_vv_found);
+    flush_raw(cx, cx.cb_rsrc_dattr, &rsrc_class_t::u_rc_dattrs, cx.dattr_vv_found);
     append_record(cx, &cx.rsrc_class_tbl, rsrc_class);
     ++cx.rsrc_class_count;
     rsrc_class.rc_cb_ID = 0;

@@ -43,7 +43,7 @@ void swap_word(char *word) {
 }
 
 bool known_type(vx_data_type_t type) {
-    return type >= VX_UNKNOWN && type <= VX_SD_PTR_ARRAY;
+    return type <= VX_SD_PTR_ARRAY;
 }
 
 bool is_array(vx_data_type_t type) {
@@ -296,6 +296,12 @@ void swap_section_of(const cdb_dsect_anchor_t &anchor, const swap_section &secti
     }
 }
 
+/* References of 0 that lead nowhere say so while the image is walked. */
+void set_words(char *image, std::span<const size_t> places, vx_uint32_t value) {
+    for (size_t place : places)
+        memcpy(image + place, &value, sizeof value);
+}
+
 } // namespace
 
 char *swap_area::take(vx_uint32_t offset, size_t head, size_t count_at, size_t entry) {
@@ -339,7 +345,7 @@ void swap_value(char *value, vx_data_type_t type, swap_area &sbase_p) {
 
 void swap_var_list(char *list) {
     char *entry = list + offsetof(variety_list_t, vl_values);
-    for (auto n = load<variety_list_t>(list).vl_count; n > 0; --n, entry += sizeof(vl_entry_t))
+    for (auto n = load_word(list + offsetof(variety_list_t, vl_count)); n > 0; --n, entry += sizeof(vl_entry_t))
         swap_fields(entry, cdb::vl_entry_fields);
     swap_fields(list, cdb::variety_list_fields);
 }
@@ -395,9 +401,10 @@ void swap_depends(char *first, vx_uint32_t count, swap_area &sbase_p, swap_area 
                  {sbase_p, vvbase_p, vlbase_p, sdbase_p});
 }
 
-void cdgen_cdef_swap(char *cdb_hdr_p) {
+void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere) {
     auto header = load<orb_cdb_header_t>(cdb_hdr_p);
     size_t file_size = size_t{header.cdb_hdr_length} + sizeof header.cdb_hdr_length;
+    set_words(cdb_hdr_p, nowhere, CDB_NONE);
     char *anchor_p = cdb_hdr_p + sizeof header;
     for (vx_uint32_t i = 0; i < header.cdb_hdr_dsect_count; ++i, anchor_p += sizeof(cdb_dsect_anchor_t)) {
         auto anchor = load<cdb_dsect_anchor_t>(anchor_p);
@@ -406,6 +413,7 @@ void cdgen_cdef_swap(char *cdb_hdr_p) {
             swap_section_of(anchor, {cdb_hdr_p + anchor.cda_offset, anchor.cda_length});
         swap_fields(anchor_p, cdb::cdb_dsect_anchor_fields);
     }
+    set_words(cdb_hdr_p, nowhere, 0);
     swap_fields(cdb_hdr_p, cdb::cdb_header_fields);
     vx_uint32_t checksum = cdb_checksum(cdb_hdr_p, load_word(cdb_hdr_p), header.cdb_hdr_length);
     memcpy(cdb_hdr_p + offsetof(orb_cdb_header_t, cdb_hdr_checksum), &checksum, sizeof checksum);

@@ -13,9 +13,8 @@ class swap_area {
 public:
     swap_area(char *start, size_t bytes) : base(start), size(bytes), taken(bytes / ALIGNMENT) {}
 
-    /* The address of what stands at an offset: a head of head bytes that begins with or contains, at count_at and
-     * count_width bytes wide, the number of entries of entry bytes that follow. Null if it is not all inside, or if it
-     * has been handed out before. */
+    /* The address of what stands at an offset: a head of head bytes, in which the word at count_at says how many
+     * entries of entry bytes follow. Null if it is not all inside, or if it has been handed out before. */
     char *take(vx_uint32_t offset, size_t head, size_t count_at = 0, size_t entry = 0);
 
 private:

@@ -21,7 +21,7 @@ void parse_options(cdgen &cx, int argc, char **argv) {
             cx.interactive = 0;
             break;
         case 'd':
-            cx.debugLevel = atoi(optarg); /* text that is no number is 0 */
+            cx.debugLevel = atoi(optarg); /* text that is no number is 0; not a conversion of the source's */
             break;
         case 's':
             cx.swap_endianness = 1;

@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <fcntl.h>
+#include <limits>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -227,7 +228,8 @@ void cache_input_data(cdgen &cx, const char *filename) {
     open_source(cx, filename);
     cx.table_id = -1;
     while (read_line(cx)) {
-        cx.linenum = static_cast<int>(static_cast<unsigned>(cx.linenum) + 1); /* may wrap, in a source of gigabytes */
+        if (cx.linenum < std::numeric_limits<int>::max())
+            ++cx.linenum;
         if (!strip_line(cx.inbuf))
             continue;
         if (cx.inbuf[0] != ' ' && cx.inbuf[0] != '\t')

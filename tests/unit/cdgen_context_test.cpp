@@ -55,4 +55,12 @@ TEST_F(Context, SecondCompilationIsLikeTheFirst) {
     EXPECT_FALSE(std::filesystem::exists(directory / "wrong.cdef"));
 }
 
+TEST_F(Context, RefusedOptionIsForgotten) {
+    std::string program = "cdgen", options = "-xn";
+    char *argv[] = {program.data(), options.data(), nullptr};
+    EXPECT_EQ(cdgen_main(2, argv), 1);
+    options = "-qq"; /* what a parser that remembers would go on with */
+    EXPECT_EQ(run(minimal, "after.cdef"), 0);
+}
+
 } // namespace

@@ -91,8 +91,10 @@ struct output_fd {
 int create_output(cdgen &cx) {
     output_fd out(above_stdio(open(cx.cdefname, O_RDWR | O_CREAT | O_CLOEXEC, 0644)));
     struct stat st = {};
-    if (out.fd < 0 || fstat(out.fd, &st) != 0)
+    if (out.fd < 0)
         cannot(cx, "Cannot create CDB file: ", errno);
+    if (fstat(out.fd, &st) != 0)
+        cannot(cx, "Cannot map CDB file: ", errno);
     if (st.st_dev == cx.cdb_fp.device && st.st_ino == cx.cdb_fp.inode)
         bld_error_exit(cx, "Cannot create CDB file: ", "it is the source file", nullptr, 1);
     if (S_ISREG(st.st_mode) && st.st_size > 0 && ftruncate(out.fd, 0) != 0)

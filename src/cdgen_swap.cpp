@@ -107,14 +107,16 @@ void swap_array(vx_uint32_t offset, vx_data_type_t element_type, swap_area &sbas
 
 void swap_out_of_line(vx_uint32_t offset, vx_data_type_t type, swap_area &sbase_p) {
     /* At offset 0 stands the first name of the class, never a value: a cell of 0 is one that was not filled. */
-    if (offset == CDB_NONE || offset == 0)
+    if (offset == CDB_NONE || offset == 0 || sbase_p.nesting == swap_area::NESTING_MAX)
         return;
+    ++sbase_p.nesting;
     if (is_array(type))
         swap_array(offset, cu_dtc_base_types_1[type], sbase_p);
     else if (type == VX_SD_PTR)
         swap_structured_data(offset, sbase_p);
     else if (type == VX_BINARY_PTR)
         swap_binary(offset, sbase_p);
+    --sbase_p.nesting;
 }
 
 /* ---- Records --------------------------------------------------------------------------------------------------- */
@@ -405,10 +407,11 @@ void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere) {
     auto header = load<orb_cdb_header_t>(cdb_hdr_p);
     size_t file_size = size_t{header.cdb_hdr_length} + sizeof header.cdb_hdr_length;
     set_words(cdb_hdr_p, nowhere, CDB_NONE);
+    swap_section file = {cdb_hdr_p, file_size};
     char *anchor_p = cdb_hdr_p + sizeof header;
-    for (vx_uint32_t i = 0; i < header.cdb_hdr_dsect_count; ++i, anchor_p += sizeof(cdb_dsect_anchor_t)) {
+    vx_uint32_t n = file.records_inside(sizeof header, header.cdb_hdr_dsect_count, sizeof(cdb_dsect_anchor_t));
+    for (; n > 0; --n, anchor_p += sizeof(cdb_dsect_anchor_t)) {
         auto anchor = load<cdb_dsect_anchor_t>(anchor_p);
-        swap_section file = {cdb_hdr_p, file_size};
         if (file.holds(anchor.cda_offset, anchor.cda_length))
             swap_section_of(anchor, {cdb_hdr_p + anchor.cda_offset, anchor.cda_length});
         swap_fields(anchor_p, cdb::cdb_dsect_anchor_fields);

@@ -361,6 +361,32 @@ inline constexpr field structured_data_element_fields[] = {
 };
 static_assert(tiles(structured_data_element_fields, sizeof(vx_structured_data_element_t)));
 
+/* The fields of a record, by its type; nothing for a type that is none. */
+template <class Record> inline constexpr std::span<const field> fields_of = {};
+template <> inline constexpr std::span<const field> fields_of<orb_cdb_header_t> = cdb_header_fields;
+template <> inline constexpr std::span<const field> fields_of<cdb_dsect_anchor_t> = cdb_dsect_anchor_fields;
+template <> inline constexpr std::span<const field> fields_of<rsrc_class_t> = class_fields;
+template <> inline constexpr std::span<const field> fields_of<rsrc_pattr_t> = pattr_fields;
+template <> inline constexpr std::span<const field> fields_of<rsrc_dattr_t> = dattr_fields;
+template <> inline constexpr std::span<const field> fields_of<rsrc_action_t> = action_fields;
+template <> inline constexpr std::span<const field> fields_of<rsrc_error_t> = error_fields;
+template <> inline constexpr std::span<const field> fields_of<rsrc_depend_t> = depend_fields;
+template <> inline constexpr std::span<const field> fields_of<vl_entry_t> = vl_entry_fields;
+template <> inline constexpr std::span<const field> fields_of<variety_list_t> = variety_list_fields;
+template <> inline constexpr std::span<const field> fields_of<vv_entry_t> = vv_entry_fields;
+template <> inline constexpr std::span<const field> fields_of<valid_values_t> = valid_values_fields;
+template <> inline constexpr std::span<const field> fields_of<sd_field_t> = sd_field_fields;
+template <> inline constexpr std::span<const field> fields_of<sd_def_t> = sd_def_fields;
+template <> inline constexpr std::span<const field> fields_of<rsrc_mgr_t> = mgr_fields;
+template <> inline constexpr std::span<const field> fields_of<rsrc_cmmap_t> = cmmap_fields;
+template <> inline constexpr std::span<const field> fields_of<rsrc_variable_class_t> = variable_class_fields;
+template <> inline constexpr std::span<const field> fields_of<rc_hash_block_t> = rc_hash_block_fields;
+template <> inline constexpr std::span<const field> fields_of<rsrc_class_hash_t> = class_hash_fields;
+template <> inline constexpr std::span<const field> fields_of<vx_array_t> = array_fields;
+template <> inline constexpr std::span<const field> fields_of<vx_structured_data_t> = structured_data_fields;
+template <>
+inline constexpr std::span<const field> fields_of<vx_structured_data_element_t> = structured_data_element_fields;
+
 } // namespace cdb
 
 #endif

@@ -6,6 +6,7 @@
 #define CDGEN_CDGEN_H
 
 #include "cdb.h"
+#include "cdb_names.h"
 #include "name_index.h"
 
 #include <array>
@@ -129,18 +130,6 @@ enum type_out_mode {
     DFLT_DEFAULT = 5, /* a persistent attribute's default */
     R_LO_DEFAULT = 6, /* a range's lower bound */
     R_HI_DEFAULT = 7  /* a range's upper bound */
-};
-
-/* A property name and its bit. */
-struct props_t {
-    char s[20];
-    vx_uint32_t p;
-};
-
-/* A permission letter and its mask. */
-struct valid_perms_t {
-    char permission;
-    vx_uint32_t mask;
 };
 
 /* The code of a type's source name; VX_UNKNOWN for null, unknown names and "UNKNOWN" itself. */
@@ -319,10 +308,6 @@ struct srtable_ctrl {
 };
 
 extern const std::array<srtable_ctrl, SC_COUNT + 1> sc_tables; /* the last one ends it: no name */
-extern const props_t rc_props[], pa_props[], da_props[], act_props[];
-extern const int rc_props_cnt, pa_props_cnt, da_props_cnt, act_props_cnt;
-extern const valid_perms_t perm_list[];
-extern const int num_perm_list;
 
 /* The index of a stanza kind by its exact name, or -1. */
 int set_table_id(const char *name);

@@ -289,30 +289,3 @@ const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name) {
     const table_attrs &attr = scp.sc_attrs[static_cast<size_t>(at)];
     return name == attr.ta_name ? &attr : nullptr;
 }
-
-const props_t rc_props[] = {
-    {"MtypDivided", 0x2000},     {"MtypCentral", 0x4000},     {"MtypGlobal", 0x8000},  {"ORBElectCoord", 0x100},
-    {"HasResources", 0x2},       {"HasConstraints", 0x80},    {"CanControl", 0x4},     {"CanDefine", 0x8},
-    {"JoinPhase0", 0x10},        {"JoinPhase1", 0x20},        {"SupportsMove", 0x200}, {"CanBatchDefine", 0x400},
-    {"CanBatchUndefine", 0x800}, {"CanBatchSetAttr", 0x1000}, {"HasIWAccess", 0x1},    {"QryReqsMonitoring", 0x20000},
-    {"CanLiveUpdate", 0x40000},
-};
-const int rc_props_cnt = std::size(rc_props);
-
-const props_t pa_props[] = {
-    {"Public", 0x20},      {"Select", 0x10},        {"ReqdForDefine", 0x2},
-    {"OptForDefine", 0x8}, {"InvalForDefine", 0x4}, {"ReadOnly", 0x1},
-};
-const int pa_props_cnt = std::size(pa_props);
-
-const props_t da_props[] = {{"Public", 0x20}, {"QryReqsMonitoring", 0x40}};
-const int da_props_cnt = std::size(da_props);
-
-const props_t act_props[] = {{"Public", 0x2}, {"LongRun", 0x1}};
-const int act_props_cnt = std::size(act_props);
-
-const valid_perms_t perm_list[] = {
-    {'q', 0x1},  {'l', 0x2},  {'e', 0x4},  {'v', 0x8},   {'d', 0x10},
-    {'c', 0x20}, {'s', 0x40}, {'o', 0x80}, {'a', 0x100}, {'x', 0x200},
-};
-const int num_perm_list = std::size(perm_list);

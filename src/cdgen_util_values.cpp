@@ -10,44 +10,7 @@
 
 namespace {
 
-constexpr const char *vxTypeStr[] = {
-    "UNKNOWN",      "None",        "Int32",       "UInt32",     "Int64",       "UInt64",
-    "Float32",      "Float64",     "String",      "Binary",     "RH",          "SD",
-    "SBS",          "Int32Array",  "UInt32Array", "Int64Array", "UInt64Array", "Float32Array",
-    "Float64Array", "StringArray", "BinaryArray", "RHArray",    "SDArray",
-};
-constexpr vx_data_type_t vxTypeMap[] = {
-    VX_UNKNOWN,
-    VX_NONE,
-    VX_INT32,
-    VX_UINT32,
-    VX_INT64,
-    VX_UINT64,
-    VX_FLOAT32,
-    VX_FLOAT64,
-    VX_CHAR_PTR,
-    VX_BINARY_PTR,
-    VX_RSRC_HANDLE_PTR,
-    VX_SD_PTR,
-    VX_SBS_PTR,
-    VX_INT32_ARRAY,
-    VX_UINT32_ARRAY,
-    VX_INT64_ARRAY,
-    VX_UINT64_ARRAY,
-    VX_FLOAT32_ARRAY,
-    VX_FLOAT64_ARRAY,
-    VX_CHAR_PTR_ARRAY,
-    VX_BINARY_PTR_ARRAY,
-    VX_RSRC_HANDLE_PTR_ARRAY,
-    VX_SD_PTR_ARRAY,
-};
-static_assert(std::size(vxTypeStr) == std::size(vxTypeMap));
-
 constexpr name_index type_names(std::size(vxTypeStr), [](size_t i) { return std::string_view(vxTypeStr[i]); });
-
-constexpr const char *vxVarStr[] = {"Counter", "Quantity", "State", "Quantum"};
-constexpr orb_variable_type_t vxVarMap[] = {ORB_COUNTER, ORB_QUANTITY, ORB_STATE, ORB_QUANTUM};
-static_assert(std::size(vxVarStr) == std::size(vxVarMap));
 
 /* A call into the C library's conversions with errno as they alone know it. */
 template <class Convert> auto converted(cdgen &cx, Convert convert) {

@@ -42,11 +42,18 @@ struct field {
     target to = target::none;              /* references */
     std::uint16_t type_at = TYPE_OF_OWNER; /* values: offset of the field that holds the data type */
     bool stays = false;                    /* an exception: left as it is in a turned file */
+    bool optional = false;                 /* references: may be none */
 };
 
 /* A row that is left as it is. */
 consteval field stays(field row) {
     row.stays = true;
+    return row;
+}
+
+/* A reference that may be none. */
+consteval field or_none(field row) {
+    row.optional = true;
     return row;
 }
 
@@ -107,27 +114,48 @@ inline constexpr field cdb_dsect_anchor_fields[] = {
 static_assert(tiles(cdb_dsect_anchor_fields, sizeof(cdb_dsect_anchor_t)));
 
 inline constexpr field class_fields[] = {
-    CDB_FIELD(rsrc_class_t, rc_cb_ID, number),         CDB_FIELD(rsrc_class_t, rc_props, number),
-    CDB_REF(rsrc_class_t, u_rc_name, strings),         CDB_REF(rsrc_class_t, u_rc_alias, strings),
-    CDB_REF(rsrc_class_t, u_rc_pattrsC, section),      CDB_REF(rsrc_class_t, u_rc_dattrsC, section),
-    CDB_REF(rsrc_class_t, u_rc_pattrs, section),       CDB_REF(rsrc_class_t, u_rc_dattrs, section),
-    CDB_REF(rsrc_class_t, u_rc_def_input, sd_defs),    CDB_REF(rsrc_class_t, u_rc_undef_input, sd_defs),
-    CDB_REF(rsrc_class_t, u_rc_online_input, sd_defs), CDB_REF(rsrc_class_t, u_rc_offline_input, sd_defs),
-    CDB_REF(rsrc_class_t, u_rc_reset_input, sd_defs),  CDB_REF(rsrc_class_t, u_rc_actionsC, section),
-    CDB_REF(rsrc_class_t, u_rc_actions, section),      CDB_REF(rsrc_class_t, u_rc_errors, section),
-    CDB_REF(rsrc_class_t, u_rc_depends, section),      CDB_REF(rsrc_class_t, u_rc_variety_lists, section),
-    CDB_REF(rsrc_class_t, u_rc_sbs_defs, section),     CDB_REF(rsrc_class_t, u_rc_sd_defs, section),
-    CDB_REF(rsrc_class_t, u_rc_valid_vals, section),   CDB_REF(rsrc_class_t, u_rc_strings, section),
-    CDB_FIELD(rsrc_class_t, rc_num_pattrsC, number),   CDB_FIELD(rsrc_class_t, rc_num_dattrsC, number),
-    CDB_FIELD(rsrc_class_t, rc_num_pattrs, number),    CDB_FIELD(rsrc_class_t, rc_num_dattrs, number),
-    CDB_FIELD(rsrc_class_t, rc_num_actionsC, number),  CDB_FIELD(rsrc_class_t, rc_num_actions, number),
-    CDB_FIELD(rsrc_class_t, rc_num_errors, number),    CDB_FIELD(rsrc_class_t, rc_num_depends, number),
-    CDB_FIELD(rsrc_class_t, rc_varlist_size, number),  CDB_FIELD(rsrc_class_t, rc_sbs_size, number),
-    CDB_FIELD(rsrc_class_t, rc_sd_size, number),       CDB_FIELD(rsrc_class_t, rc_valval_size, number),
-    CDB_FIELD(rsrc_class_t, rc_perm_temp, number),     CDB_FIELD(rsrc_class_t, rc_perm_tempC, number),
-    CDB_FIELD(rsrc_class_t, rc_class_id, number),      CDB_FIELD(rsrc_class_t, rc_dscr_msgid, number),
-    CDB_FIELD(rsrc_class_t, rc_disp_msgid, number),    CDB_FIELD(rsrc_class_t, rc_locator, number),
-    CDB_FIELD(rsrc_class_t, rc_version, number),       CDB_FIELD(rsrc_class_t, rc_spare, reserved),
+    CDB_FIELD(rsrc_class_t, rc_cb_ID, number),
+    CDB_FIELD(rsrc_class_t, rc_props, number),
+    CDB_REF(rsrc_class_t, u_rc_name, strings),
+    or_none(CDB_REF(rsrc_class_t, u_rc_alias, strings)),
+    CDB_REF(rsrc_class_t, u_rc_pattrsC, section),
+    CDB_REF(rsrc_class_t, u_rc_dattrsC, section),
+    CDB_REF(rsrc_class_t, u_rc_pattrs, section),
+    CDB_REF(rsrc_class_t, u_rc_dattrs, section),
+    or_none(CDB_REF(rsrc_class_t, u_rc_def_input, sd_defs)),
+    or_none(CDB_REF(rsrc_class_t, u_rc_undef_input, sd_defs)),
+    or_none(CDB_REF(rsrc_class_t, u_rc_online_input, sd_defs)),
+    or_none(CDB_REF(rsrc_class_t, u_rc_offline_input, sd_defs)),
+    or_none(CDB_REF(rsrc_class_t, u_rc_reset_input, sd_defs)),
+    CDB_REF(rsrc_class_t, u_rc_actionsC, section),
+    CDB_REF(rsrc_class_t, u_rc_actions, section),
+    CDB_REF(rsrc_class_t, u_rc_errors, section),
+    CDB_REF(rsrc_class_t, u_rc_depends, section),
+    CDB_REF(rsrc_class_t, u_rc_variety_lists, section),
+    CDB_REF(rsrc_class_t, u_rc_sbs_defs, section),
+    CDB_REF(rsrc_class_t, u_rc_sd_defs, section),
+    CDB_REF(rsrc_class_t, u_rc_valid_vals, section),
+    CDB_REF(rsrc_class_t, u_rc_strings, section),
+    CDB_FIELD(rsrc_class_t, rc_num_pattrsC, number),
+    CDB_FIELD(rsrc_class_t, rc_num_dattrsC, number),
+    CDB_FIELD(rsrc_class_t, rc_num_pattrs, number),
+    CDB_FIELD(rsrc_class_t, rc_num_dattrs, number),
+    CDB_FIELD(rsrc_class_t, rc_num_actionsC, number),
+    CDB_FIELD(rsrc_class_t, rc_num_actions, number),
+    CDB_FIELD(rsrc_class_t, rc_num_errors, number),
+    CDB_FIELD(rsrc_class_t, rc_num_depends, number),
+    CDB_FIELD(rsrc_class_t, rc_varlist_size, number),
+    CDB_FIELD(rsrc_class_t, rc_sbs_size, number),
+    CDB_FIELD(rsrc_class_t, rc_sd_size, number),
+    CDB_FIELD(rsrc_class_t, rc_valval_size, number),
+    CDB_FIELD(rsrc_class_t, rc_perm_temp, number),
+    CDB_FIELD(rsrc_class_t, rc_perm_tempC, number),
+    CDB_FIELD(rsrc_class_t, rc_class_id, number),
+    CDB_FIELD(rsrc_class_t, rc_dscr_msgid, number),
+    CDB_FIELD(rsrc_class_t, rc_disp_msgid, number),
+    CDB_FIELD(rsrc_class_t, rc_locator, number),
+    CDB_FIELD(rsrc_class_t, rc_version, number),
+    CDB_FIELD(rsrc_class_t, rc_spare, reserved),
 };
 static_assert(tiles(class_fields, sizeof(rsrc_class_t)));
 
@@ -143,8 +171,8 @@ inline constexpr field pattr_fields[] = {
     CDB_FIELD(rsrc_pattr_t, ra_attr_id, number),
     CDB_FIELD(rsrc_pattr_t, ra_data_type, number),
     CDB_REF(rsrc_pattr_t, u_ra_variety_list, variety_lists),
-    CDB_REF(rsrc_pattr_t, u_ra_valid_vals, valid_vals),
-    CDB_REF(rsrc_pattr_t, u_ra_sd, sd_defs),
+    or_none(CDB_REF(rsrc_pattr_t, u_ra_valid_vals, valid_vals)),
+    or_none(CDB_REF(rsrc_pattr_t, u_ra_sd, sd_defs)),
     CDB_FIELD(rsrc_pattr_t, ra_max_sd_idx, number),
     CDB_FIELD(rsrc_pattr_t, ra_reserved2, reserved),
 };
@@ -160,10 +188,10 @@ inline constexpr field dattr_fields[] = {
     CDB_VALUE(rsrc_dattr_t, ra_min_value, offsetof(rsrc_dattr_t, ra_data_type)),
     CDB_VALUE(rsrc_dattr_t, ra_max_value, offsetof(rsrc_dattr_t, ra_data_type)),
     CDB_REF(rsrc_dattr_t, u_ra_variety_list, variety_lists),
-    CDB_REF(rsrc_dattr_t, u_ra_valid_vals, valid_vals),
-    CDB_REF(rsrc_dattr_t, u_ra_sd, sd_defs),
-    CDB_REF(rsrc_dattr_t, u_ra_express, strings),
-    CDB_REF(rsrc_dattr_t, u_ra_rearm_expr, strings),
+    or_none(CDB_REF(rsrc_dattr_t, u_ra_valid_vals, valid_vals)),
+    or_none(CDB_REF(rsrc_dattr_t, u_ra_sd, sd_defs)),
+    or_none(CDB_REF(rsrc_dattr_t, u_ra_express, strings)),
+    or_none(CDB_REF(rsrc_dattr_t, u_ra_rearm_expr, strings)),
     CDB_REF(rsrc_dattr_t, u_ra_ZAV_name, strings),
     CDB_FIELD(rsrc_dattr_t, ra_data_type, number),
     CDB_FIELD(rsrc_dattr_t, ra_var_type, number),
@@ -182,12 +210,18 @@ inline constexpr field dattr_fields[] = {
 static_assert(tiles(dattr_fields, sizeof(rsrc_dattr_t)));
 
 inline constexpr field action_fields[] = {
-    CDB_FIELD(rsrc_action_t, ac_cb_ID, number),      CDB_FIELD(rsrc_action_t, ac_action_id, number),
-    CDB_FIELD(rsrc_action_t, ac_props, number),      CDB_FIELD(rsrc_action_t, ac_dscr_msgid, number),
-    CDB_FIELD(rsrc_action_t, ac_disp_msgid, number), CDB_FIELD(rsrc_action_t, ac_confirm_msgid, number),
-    CDB_FIELD(rsrc_action_t, ac_timeout, number),    CDB_FIELD(rsrc_action_t, ac_perms, number),
-    CDB_REF(rsrc_action_t, u_ac_name, strings),      CDB_REF(rsrc_action_t, u_ac_variety_list, variety_lists),
-    CDB_REF(rsrc_action_t, u_ac_sd_input, sd_defs),  CDB_REF(rsrc_action_t, u_ac_sd_resp, sd_defs),
+    CDB_FIELD(rsrc_action_t, ac_cb_ID, number),
+    CDB_FIELD(rsrc_action_t, ac_action_id, number),
+    CDB_FIELD(rsrc_action_t, ac_props, number),
+    CDB_FIELD(rsrc_action_t, ac_dscr_msgid, number),
+    CDB_FIELD(rsrc_action_t, ac_disp_msgid, number),
+    CDB_FIELD(rsrc_action_t, ac_confirm_msgid, number),
+    CDB_FIELD(rsrc_action_t, ac_timeout, number),
+    CDB_FIELD(rsrc_action_t, ac_perms, number),
+    CDB_REF(rsrc_action_t, u_ac_name, strings),
+    CDB_REF(rsrc_action_t, u_ac_variety_list, variety_lists),
+    or_none(CDB_REF(rsrc_action_t, u_ac_sd_input, sd_defs)),
+    or_none(CDB_REF(rsrc_action_t, u_ac_sd_resp, sd_defs)),
 };
 static_assert(tiles(action_fields, sizeof(rsrc_action_t)));
 
@@ -199,7 +233,7 @@ inline constexpr field error_fields[] = {
     CDB_FIELD(rsrc_error_t, re_disp_msgid, number),
     CDB_REF(rsrc_error_t, u_re_name, strings),
     CDB_REF(rsrc_error_t, u_re_variety_list, variety_lists),
-    CDB_REF(rsrc_error_t, u_re_sd_input, sd_defs),
+    or_none(CDB_REF(rsrc_error_t, u_re_sd_input, sd_defs)),
     CDB_FIELD(rsrc_error_t, re_perms, number),
     CDB_FIELD(rsrc_error_t, re_reserved, reserved),
 };
@@ -241,10 +275,14 @@ inline constexpr field valid_values_fields[] = {
 static_assert(tiles(valid_values_fields, sizeof(valid_values_t)));
 
 inline constexpr field sd_field_fields[] = {
-    CDB_REF(sd_field_t, u_sd_field_name, strings),    CDB_FIELD(sd_field_t, sd_field_type, number),
-    CDB_FIELD(sd_field_t, sd_disp_msgid, number),     CDB_FIELD(sd_field_t, sd_dscr_msgid, number),
-    CDB_REF(sd_field_t, u_sd_valid_vals, valid_vals), CDB_FIELD(sd_field_t, sd_action_id, number),
-    CDB_FIELD(sd_field_t, sd_valid_type, number),     CDB_FIELD(sd_field_t, sd_reserved, reserved),
+    CDB_REF(sd_field_t, u_sd_field_name, strings),
+    CDB_FIELD(sd_field_t, sd_field_type, number),
+    CDB_FIELD(sd_field_t, sd_disp_msgid, number),
+    CDB_FIELD(sd_field_t, sd_dscr_msgid, number),
+    or_none(CDB_REF(sd_field_t, u_sd_valid_vals, valid_vals)),
+    CDB_FIELD(sd_field_t, sd_action_id, number),
+    CDB_FIELD(sd_field_t, sd_valid_type, number),
+    CDB_FIELD(sd_field_t, sd_reserved, reserved),
 };
 static_assert(tiles(sd_field_fields, sizeof(sd_field_t)));
 
@@ -306,7 +344,7 @@ inline constexpr field variable_class_fields[] = {
     CDB_FIELD(rsrc_variable_class_t, rvc_obsv_interval, number),
     CDB_FIELD(rsrc_variable_class_t, rvc_report_interval, number),
     CDB_REF(rsrc_variable_class_t, u_rvc_name, strings),
-    CDB_REF(rsrc_variable_class_t, u_rvc_compat_name, strings),
+    or_none(CDB_REF(rsrc_variable_class_t, u_rvc_compat_name, strings)),
     CDB_FIELD(rsrc_variable_class_t, rvc_var_count, number),
     CDB_REF(rsrc_variable_class_t, u_rvc_string_tbl, none),
     CDB_FIELD(rsrc_variable_class_t, rvc_reserved, reserved),

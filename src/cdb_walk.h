@@ -1,0 +1,173 @@
+/* cdb_walk.h: the one walk over a database that verification and the map of its regions share. It visits whatever the
+ * header leads to once, says which rules are broken, and, if asked to, what each stretch of the file is. */
+#ifndef CDGEN_CDB_WALK_H
+#define CDGEN_CDB_WALK_H
+
+#include "cdb_view.h"
+
+namespace cdb {
+
+/* The rules, by their position in rules(). */
+enum class check : std::size_t {
+    FILE_SHORT,
+    FILE_LENGTH,
+    FORMAT,
+    CHECKSUM,
+    RECORD_SIZE,
+    RESERVED,
+    LARGEST_ID,
+    ANCHORS_OUTSIDE,
+    SECTION_OUTSIDE,
+    SECTION_PLACE,
+    SECTION_TYPE,
+    SECTION_UNUSED,
+    SECTION_LENGTH,
+    SECTION_ORDER,
+    RECORD_ID,
+    TABLE_PLACE,
+    TABLE_OUTSIDE,
+    REFERENCE_NONE,
+    REFERENCE_OUTSIDE,
+    REFERENCE_UNALIGNED,
+    LIST_OUTSIDE,
+    LIST_SHARED,
+    TEXT_OUTSIDE,
+    DATA_TYPE,
+    VARIABLE_TYPE,
+    VARIABLE_ID,
+    UNKNOWN_TYPE,
+    TEXT_MISSING,
+    CUT_SHORT,
+    SD_MISSING,
+    LIST_UNREACHED,
+    VALUE_OUTSIDE,
+    VALUE_UNALIGNED,
+    VALUE_SHARED,
+    VALUE_NESTING,
+    VALUE_TYPE,
+    VALUE_MISSING,
+    RANGE_ASTRAY,
+    SD_DIFFERS,
+    COUNT
+};
+
+const rule &rule_of(check broken);
+
+/* Where the walk is, for findings and regions. */
+struct spot {
+    std::optional<std::size_t> section;
+    std::string_view record = {};
+    std::size_t index = 0;
+    std::size_t offset = 0; /* of the record, in the file */
+};
+
+/* A stretch in which things stand that references lead to: each belongs to one owner. */
+class extent {
+public:
+    static constexpr std::size_t UNIT = 8; /* every thing begins at a multiple of it */
+
+    enum class claim_result { FIRST, AGAIN, OVERLAPS };
+
+    extent(const bytes &covered, std::size_t file_offset);
+
+    /* Claims length bytes, all inside the area, from a multiple of UNIT on. AGAIN: they are claimed from the same place
+     * on already. Takes time in proportion to what it newly claims. */
+    claim_result claim(std::size_t at, std::size_t length);
+    /* at < area.size() */
+    bool is_taken(std::size_t at) const {
+        return taken[at / UNIT] != 0;
+    }
+
+    static constexpr std::size_t units(std::size_t size) {
+        return (size + UNIT - 1) / UNIT;
+    }
+
+    bytes area;
+    std::size_t offset; /* of the area in the file */
+
+private:
+    std::vector<std::uint32_t> taken; /* by unit: the unit, counted from 1, at which what covers it begins; 0: free */
+
+public:
+    std::vector<bool> text_starts; /* by unit: a text begins there */
+    std::size_t texts_end;         /* behind the last zero byte: a text that begins before it ends */
+};
+
+class walker {
+public:
+    walker(const database &walked, std::vector<finding> &to, std::vector<region> *map)
+        : db(walked), findings(to), regions(map) {}
+
+    void walk();
+
+    /* -- saying what was seen -- */
+
+    void report(check broken, const spot &at, std::string_view field, std::size_t offset, std::string found,
+                std::string expected);
+    /* Numbers, in decimal. */
+    void report(check broken, const spot &at, std::string_view field, std::size_t offset, std::uint64_t found,
+                std::uint64_t expected);
+    void add_region(const spot &at, std::size_t offset, std::size_t size, std::string_view name,
+                    const field *what = nullptr);
+
+    /* -- records of any kind -- */
+
+    /* The regions of a record's fields, and whether its reserved ones are zero. Lists' entries are not part of it. */
+    template <class Record> void visit(const spot &at, const bytes &area, std::size_t offset) {
+        visit_fields(at, area, offset, fields_of<Record>);
+    }
+    void expect_id(const spot &at, std::string_view field, vx_uint32_t found, vx_uint32_t expected);
+    /* Whether the bytes are all zero; reports if not. */
+    void expect_zero(const spot &at, std::string_view field, const bytes &area, std::size_t offset, std::size_t length);
+
+    /* The text that a record's reference leads to. */
+    void visit_text(const spot &at, const field &ref, std::uint32_t offset, extent &strings);
+    /* Regions of texts and their filling, once all texts are known. */
+    void finish_texts(spot at, extent &strings);
+
+    /* A dynamic attribute that variable classes may refer to. */
+    void note_dynamic_id(std::int32_t id, bool of_class);
+
+    const database &db;
+
+    /* While set, what would be an error is this warning: the compiler can make it of a careless source. */
+    std::optional<check> excuse;
+
+private:
+    void visit_fields(const spot &at, const bytes &area, std::size_t offset, std::span<const field> fields);
+    bool walk_header();
+    void check_length();
+    void check_checksum();
+    void check_record_sizes();
+    void check_largest_ids();
+    void walk_anchors();
+    void walk_anchor(std::size_t index);
+    bool place_section(const spot &at, const cdb_dsect_anchor_t &anchor);
+    void walk_section(const spot &anchor_at, const cdb_dsect_anchor_t &anchor);
+    void walk_class_section(spot at, const bytes &section);
+    void walk_manager(spot at, const bytes &section);
+    void walk_map(spot at, const bytes &section);
+    void walk_variable_class(spot at, const bytes &section);
+    void walk_variable_ids(const spot &at, const bytes &section, std::size_t first, std::size_t count);
+    void walk_class_hash(spot at, const bytes &section);
+    void walk_text(const spot &at, extent &strings, std::size_t start, std::size_t end);
+    void expect_rounded(const spot &at, const bytes &section, std::size_t strings_at);
+    void look_ahead();
+
+    struct section_kind;
+    static const section_kind section_kinds[];
+
+    std::vector<finding> &findings;
+    std::vector<region> *regions;
+    std::size_t sections_end = 0;  /* of what has been walked, in the file */
+    int section_rank = 0;          /* the highest so far, in the order of types */
+    std::size_t last_class = 0;    /* position of the last class among the anchors */
+    std::vector<bool> dynamic_ids; /* by the low 16 bits of a variable ID: a dynamic attribute has it */
+};
+
+/* Walks one class section (cdb_walk_class.cpp). is_last: no class follows it in the file. */
+void walk_class(walker &walk, const spot &at, const bytes &section, bool is_last);
+
+} // namespace cdb
+
+#endif

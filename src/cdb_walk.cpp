@@ -161,17 +161,10 @@ void walker::expect_zero(const spot &at, std::string_view field, const bytes &ar
     report(check::RESERVED, at, field, at.offset + distance, hex(std::to_integer<unsigned>(*wrong)), "0x0");
 }
 
-void walker::visit_fields(const spot &at, const bytes &area, std::size_t offset, std::span<const field> fields) {
+void walker::add_regions(const spot &at, const bytes &area, std::size_t offset, std::span<const field> fields) {
     for (const field &f : fields) {
-        if (f.kind == field_kind::entries)
-            continue;
         std::size_t size = std::size_t{f.width} * f.count;
-        if (f.kind == field_kind::reserved) {
-            spot place = at;
-            place.offset += f.offset;
-            expect_zero(place, f.name, area, offset + f.offset, size);
-        }
-        if (regions != nullptr && area.holds(offset + f.offset, size))
+        if (f.kind != field_kind::entries && area.holds(offset + f.offset, size))
             add_region(at, at.offset + f.offset, size, at.record, &f);
     }
 }
@@ -240,20 +233,27 @@ void walker::check_length() {
                hex(db.header().cdb_hdr_format), hex(CDB_FORMAT));
 }
 
-/* XORing words does not depend on the byte order: it is enough to turn the result. */
+/* XORing words depends neither on their order nor on that of their bytes: it is done two words at a time, and the
+ * result is turned. */
 void walker::check_checksum() {
-    auto raw = db.file().raw();
     constexpr std::size_t FIRST = offsetof(orb_cdb_header_t, cdb_hdr_format);
     constexpr std::size_t WORD = sizeof(std::uint32_t);
+    auto raw = db.file().raw();
     std::size_t length = std::min<std::size_t>(db.header().cdb_hdr_length, raw.size() - WORD);
-    std::uint32_t sum = 0;
-    std::memcpy(&sum, raw.data(), WORD);
-    for (std::size_t at = FIRST; at + WORD <= length + WORD; at += WORD) {
-        std::uint32_t word = 0;
-        std::memcpy(&word, raw.data() + at, WORD);
-        sum ^= word;
+    std::size_t words = length < WORD ? 0 : (length - WORD) / WORD;
+    std::array<std::uint32_t, 2> sum = {};
+    std::memcpy(sum.data(), raw.data(), WORD);
+    for (std::size_t i = 0; i < words / 2; ++i) {
+        std::array<std::uint32_t, 2> pair;
+        std::memcpy(pair.data(), raw.data() + FIRST + i * sizeof pair, sizeof pair);
+        sum[0] ^= pair[0];
+        sum[1] ^= pair[1];
     }
-    auto turned = bytes(std::as_bytes(std::span(&sum, 1)), db.order()).number<std::uint32_t>(0);
+    std::uint32_t odd_one = 0;
+    if (words % 2 != 0)
+        std::memcpy(&odd_one, raw.data() + FIRST + (words - 1) * WORD, WORD);
+    sum[0] ^= sum[1] ^ odd_one;
+    auto turned = bytes(std::as_bytes(std::span(sum)), db.order()).number<std::uint32_t>(0);
     if (turned != db.header().cdb_hdr_checksum)
         report(check::CHECKSUM, whole_file, "cdb_hdr_checksum", offsetof(orb_cdb_header_t, cdb_hdr_checksum),
                hex(db.header().cdb_hdr_checksum), hex(turned));

@@ -53,6 +53,28 @@ enum class check : std::size_t {
 
 const rule &rule_of(check broken);
 
+/* Those of a record's fields for which a condition holds, picked out while compiling. */
+template <class Record, auto Condition> struct picked_fields {
+    static constexpr std::size_t count =
+        static_cast<std::size_t>(std::count_if(fields_of<Record>.begin(), fields_of<Record>.end(), Condition));
+    static constexpr std::array<field, count> fields = [] {
+        std::array<field, count> picked = {};
+        std::copy_if(fields_of<Record>.begin(), fields_of<Record>.end(), picked.begin(), Condition);
+        return picked;
+    }();
+};
+
+template <class Record>
+inline constexpr std::span<const field> reserved_fields_of =
+    picked_fields<Record, [](const field &f) { return f.kind == field_kind::reserved; }>::fields;
+
+/* Those that lead to a text, a list or a value. */
+template <class Record>
+inline constexpr std::span<const field> leading_fields_of = picked_fields<Record, [](const field &f) {
+    return f.kind == field_kind::value ||
+           (f.kind == field_kind::reference && f.to != target::none && f.to != target::section);
+}>::fields;
+
 /* Where the walk is, for findings and regions. */
 struct spot {
     std::optional<std::size_t> section;
@@ -114,7 +136,10 @@ public:
 
     /* The regions of a record's fields, and whether its reserved ones are zero. Lists' entries are not part of it. */
     template <class Record> void visit(const spot &at, const bytes &area, std::size_t offset) {
-        visit_fields(at, area, offset, fields_of<Record>);
+        for (const field &f : reserved_fields_of<Record>)
+            expect_reserved(at, area, offset, f);
+        if (regions != nullptr)
+            add_regions(at, area, offset, fields_of<Record>);
     }
     void expect_id(const spot &at, std::string_view field, vx_uint32_t found, vx_uint32_t expected);
     /* Whether the bytes are all zero; reports if not. */
@@ -134,7 +159,12 @@ public:
     std::optional<check> excuse;
 
 private:
-    void visit_fields(const spot &at, const bytes &area, std::size_t offset, std::span<const field> fields);
+    void expect_reserved(const spot &at, const bytes &area, std::size_t offset, const field &f) {
+        spot place = at;
+        place.offset += f.offset;
+        expect_zero(place, f.name, area, offset + f.offset, std::size_t{f.width} * f.count);
+    }
+    void add_regions(const spot &at, const bytes &area, std::size_t offset, std::span<const field> fields);
     bool walk_header();
     void check_length();
     void check_checksum();

@@ -216,12 +216,11 @@ void class_walk::follow_reference(const spot &place, const field &f, std::uint32
     }
 }
 
-/* Everything that a record leads to. owner_type: of its values, where the record itself does not know it. */
+/* Everything that a record's leading fields lead to. owner_type: of its values, where the record itself does not know
+ * it. */
 void class_walk::follow(const spot &place, const bytes &area, std::size_t offset, std::span<const field> fields,
                         vx_data_type_t owner_type) {
     for (const field &f : fields) {
-        if (f.kind != field_kind::reference && f.kind != field_kind::value)
-            continue;
         auto word = area.number<std::uint32_t>(offset + f.offset);
         auto type = f.type_at == TYPE_OF_OWNER ? owner_type : area.number<vx_data_type_t>(offset + f.type_at);
         if (postpone(place, f, word, type))
@@ -247,7 +246,7 @@ void class_walk::walk_attribute(const spot &place, std::size_t offset, vx_uint32
     }
     may_be_cut_short = last && !is_last;
     range_may_be_astray = id == CDB_ID_DATTR;
-    follow(place, section, offset, fields_of<Record>, record.ra_data_type);
+    follow(place, section, offset, leading_fields_of<Record>, record.ra_data_type);
     may_be_cut_short = range_may_be_astray = false;
     if (element_type(record.ra_data_type) == VX_SD_PTR)
         check_structure(place, record);
@@ -306,7 +305,7 @@ void class_walk::walk_actions(const cdb_ref_t &ref, std::size_t count, vx_uint32
     for (; place.index < count; ++place.index, offset += sizeof(rsrc_action_t), place.offset += sizeof(rsrc_action_t)) {
         walk.visit<rsrc_action_t>(place, section, offset);
         walk.expect_id(place, "ac_cb_ID", section.number<vx_uint32_t>(offset), id);
-        follow(place, section, offset, action_fields, VX_UNKNOWN);
+        follow(place, section, offset, leading_fields_of<rsrc_action_t>, VX_UNKNOWN);
     }
 }
 
@@ -316,7 +315,7 @@ void class_walk::walk_errors() {
     spot place = {at.section, "rsrc_error_t", 0, at.offset + offset};
     for (; place.index < count; ++place.index, offset += sizeof(rsrc_error_t), place.offset += sizeof(rsrc_error_t)) {
         walk.visit<rsrc_error_t>(place, section, offset);
-        follow(place, section, offset, error_fields, VX_UNKNOWN);
+        follow(place, section, offset, leading_fields_of<rsrc_error_t>, VX_UNKNOWN);
     }
 }
 
@@ -386,7 +385,7 @@ void class_walk::walk_valid_values(const spot &place, const field &ref, std::uin
     for (; entry.index < count; ++entry.index, entry.offset += sizeof(vv_entry_t)) {
         std::size_t in_table = entry.offset - valid_vals.offset;
         walk.visit<vv_entry_t>(entry, valid_vals.area, in_table);
-        follow(entry, valid_vals.area, in_table, vv_entry_fields, element_type(type));
+        follow(entry, valid_vals.area, in_table, leading_fields_of<vv_entry_t>, element_type(type));
     }
 }
 
@@ -401,7 +400,7 @@ void class_walk::walk_sd_definition(const spot &place, const field &ref, std::ui
         auto type = sd_defs.area.number<vx_data_type_t>(in_table + offsetof(sd_field_t, sd_field_type));
         walk.visit<sd_field_t>(element, sd_defs.area, in_table);
         expect_data_type(element, "sd_field_type", offsetof(sd_field_t, sd_field_type), type);
-        follow(element, sd_defs.area, in_table, sd_field_fields, type);
+        follow(element, sd_defs.area, in_table, leading_fields_of<sd_field_t>, type);
     }
 }
 
@@ -542,7 +541,7 @@ void class_walk::walk_structured_data(const spot &place, std::string_view field,
         walk.visit<vx_structured_data_element_t>(element, strings.area, in_strings);
         if (!is_data_type(type))
             walk.report(check::VALUE_TYPE, element, "data_type", element.offset, std::to_string(type), "0 to 22");
-        follow(element, strings.area, in_strings, structured_data_element_fields, VX_UNKNOWN);
+        follow(element, strings.area, in_strings, leading_fields_of<vx_structured_data_element_t>, VX_UNKNOWN);
     }
 }
 
@@ -556,7 +555,7 @@ void class_walk::run() {
     walk_attributes<rsrc_dattr_t>(rc.u_rc_dattrsC, rc.rc_num_dattrsC, "rsrc_dattr_t", CDB_ID_DATTR_C);
     walk_attributes<rsrc_pattr_t>(rc.u_rc_pattrs, rc.rc_num_pattrs, "rsrc_pattr_t", CDB_ID_PATTR);
     walk_attributes<rsrc_dattr_t>(rc.u_rc_dattrs, rc.rc_num_dattrs, "rsrc_dattr_t", CDB_ID_DATTR);
-    follow(at, section, 0, class_fields, VX_UNKNOWN);
+    follow(at, section, 0, leading_fields_of<rsrc_class_t>, VX_UNKNOWN);
     walk_actions(rc.u_rc_actionsC, rc.rc_num_actionsC, CDB_ID_ACTION_C);
     walk_actions(rc.u_rc_actions, rc.rc_num_actions, CDB_ID_ACTION);
     walk_errors();

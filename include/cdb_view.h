@@ -33,7 +33,7 @@ namespace cdb {
 
 /* ---- Data types ------------------------------------------------------------------------------------------------ */
 
-/* Values inside values are followed at most so deep. (The compiler writes 3.) */
+/* Values inside values are followed at most so deep. (The compiler writes 4.) */
 inline constexpr unsigned NESTING_MAX = 64;
 
 /* One of the 23 data types. */

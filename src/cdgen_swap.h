@@ -17,7 +17,7 @@ public:
      * entries of entry bytes follow. Null if it is not all inside, or if it has been handed out before. */
     char *take(vx_uint32_t offset, size_t head, size_t count_at = 0, size_t entry = 0);
 
-    /* Values inside values, at most so many deep: recursion must end whatever a file says. (The compiler writes 3.) */
+    /* Values inside values, at most so many deep: recursion must end whatever a file says. (The compiler writes 4.) */
     static constexpr unsigned NESTING_MAX = 64;
     unsigned nesting = 0; /* values being reversed */
 

@@ -4,13 +4,15 @@ A second, small statement of the reversal rules, used to check what the
 compiler's option -s writes: reading the native file and turning it here must
 give the same bytes.  References are followed while everything is still native;
 a list, a definition or a value reached twice is turned once; a reference that
-does not lead into its own table, whole, is not followed.
+does not lead into its own table, whole and on a multiple of four, is not
+followed, and neither is a value cell that nothing has filled.
 """
 
 import struct
 import sys
 
 NONE = 0xFFFFFFFF
+NESTING_MAX = 64  # values inside values; only a hand-made file goes deeper
 CLASS, MANAGER, MAP, VARCLASS, HASH = 5, 3, 6, 4, 7
 
 
@@ -22,6 +24,7 @@ class Reverser:
         self.out = bytearray(image)
         self.mark = "<" if image[8:12] == b"1tmf" else ">"
         self.seen = set()
+        self.depth = 0
 
     def get(self, at, width=4):
         """A native number."""
@@ -37,52 +40,49 @@ class Reverser:
         start = record + self.get(record + offset)
         return start, start + size
 
-    def target(self, table, offset, header, entry):
-        """Where a reference leads, once, if the item fits its table; or None.
+    def target(self, table, offset, header, entry, count_at=4):
+        """Where a reference leads, and how many entries stand there.
 
-        The count that sizes the item is its word at byte 4 for lists (header
-        8, count second) and at byte 0 for values, told by the entry's sign.
+        Once only, and if the item fits its table; otherwise None.  The count
+        is the word at byte 4 of a list and at byte 0 of a value.
         """
-        if offset == NONE:
-            return None
         at = table[0] + offset
-        if at + header > table[1]:
+        if offset == NONE or offset % 4 or at + header > table[1]:
             return None
-        count = self.get(at) if entry < 0 else self.get(at + 4)
-        if at + header + abs(entry) * count > table[1] or at in self.seen:
+        count = self.get(at + count_at)
+        if at + header + entry * count > table[1] or at in self.seen:
             return None
         self.seen.add(at)
         return at, count
 
     def value(self, at, kind, strings):
         """A value cell and what it refers to."""
-        offset = self.get(at)
-        if kind in (2, 3, 6):
+        if kind in (2, 3, 6, 8, 10):
             self.turn(4, at)
         elif kind in (4, 5, 7):
             self.turn(8, at)
-        elif kind in (8, 10):
+        elif kind in (9, 11) or 13 <= kind <= 22:
+            offset = self.get(at)
+            if offset != 0 and self.depth < NESTING_MAX:  # 0 is the first name's place: the cell was never filled
+                self.depth += 1
+                self.out_of_line(offset, kind, strings)
+                self.depth -= 1
             self.turn(4, at)
-        elif kind == 9:
-            place = strings[0] + offset
-            if offset != NONE and place + 4 <= strings[1]:
-                self.turn(4, place)
-            self.turn(4, at)
-        elif kind == 11:
-            found = self.target(strings, offset, 8, -16)
-            if found:
-                for element in range(found[0] + 8, found[0] + 8 + 16 * found[1], 16):
-                    self.value(element + 8, self.get(element), strings)
-                    self.turn(4, element)
-                self.turn(4, found[0])
-            self.turn(4, at)
-        elif 13 <= kind <= 22:
-            found = self.target(strings, offset, 8, -8)
-            if found:
-                for element in range(found[0] + 8, found[0] + 8 + 8 * found[1], 8):
-                    self.value(element, kind - 11, strings)
-                self.turn(4, found[0])
-            self.turn(4, at)
+
+    def out_of_line(self, offset, kind, strings):
+        """What a Binary, SD or array cell refers to; a Binary's bytes stay."""
+        header, entry = {9: (4, 0), 11: (8, 16)}.get(kind, (8, 8))
+        found = self.target(strings, offset, header, entry, count_at=0)
+        if not found:
+            return
+        at, count = found
+        for element in range(at + header, at + header + entry * count, entry or 1):
+            if kind == 11:
+                self.value(element + 8, self.get(element), strings)
+                self.turn(4, element)
+            else:
+                self.value(element, kind - 11, strings)
+        self.turn(4, at)
 
     def variety(self, offset, tables):
         """A variety list."""

@@ -1,0 +1,298 @@
+#!/usr/bin/env python3
+"""Measure cdgen against other compilers, against what no program can beat, and against its targets; print one table.
+
+Medians and ratios hold within one run only: machines are busy in different ways at different times.
+"""
+
+import argparse
+import functools
+import math
+import os
+import pathlib
+import platform
+import sys
+import tempfile
+import typing
+
+import generate
+import measure
+import peers
+
+MIXED = "attributes, mixed"
+# What grows, alone: a source for a count.
+GROWTH = {
+    MIXED: lambda n: generate.source(attributes=n),
+    "actions": lambda n: generate.source(actions=n),
+    "SD elements of one run": lambda n: generate.source(elements=n),
+    "valid values of one list": lambda n: generate.source(valid_values=n),
+    "varieties of one list": lambda n: generate.source(varieties=n),
+    "defaults of one array": lambda n: generate.source(array_defaults=n),
+    "variable classes, unnamed": lambda n: generate.source(variable_classes=n),
+    "variable classes, named": lambda n: generate.source(variable_classes=n, members_count=n),
+    "classes": lambda n: generate.source(classes=n),
+    "strings of 230 characters": lambda n: generate.source(strings=n, string_length=230),
+}
+MB = 1e6
+
+
+class Plan(typing.NamedTuple):
+    """How much is measured."""
+
+    small: int  # the two sizes between which growth is told
+    large: int
+    rounds: int
+    start_rounds: int
+    start_runs: int  # in each round
+
+
+FULL = Plan(10000, 60000, 7, 20, 200)
+QUICK = Plan(1000, 6000, 3, 5, 100)
+
+
+class Verdict(typing.NamedTuple):
+    """A figure, the target it is held against, and whether it meets it."""
+
+    finding: str = ""
+    target: str = ""
+    met: typing.Optional[bool] = None
+
+
+class Row(typing.NamedTuple):
+    """A line of the table; what has no meaning in it is None."""
+
+    name: str
+    size: typing.Optional[int] = None  # bytes of source
+    cost: typing.Optional[measure.Cost] = None
+    instructions: typing.Optional[int] = None
+    verdict: Verdict = Verdict()
+
+
+class Bench:
+    """The programs, the directory of their inputs, and the rows as they come in."""
+
+    def __init__(self, build, example, directory, plan):
+        self.cdgen, self.empty = build / "cdgen", build / "bench" / "bench_empty"
+        self.launcher = measure.Launcher(build / "bench" / "bench_launch")
+        self.example, self.directory, self.plan = example, directory, plan
+        self.rows = []
+
+    def add(self, *args, **kwargs):
+        """One more line of the table."""
+        self.rows.append(Row(*args, **kwargs))
+
+    def job(self, source, *options):
+        """cdgen on a source of the directory."""
+        return measure.Job([self.cdgen, *options, source, "out.cdef"], self.directory, "out.cdef")
+
+    @functools.lru_cache(maxsize=None)
+    def source(self, dimension, count):
+        """The name of a generated source, which is written when it is first asked for."""
+        path = self.directory / f"{list(GROWTH).index(dimension)}-{count}.cdefsrc"
+        with open(path, "w", encoding="ascii") as file:
+            file.writelines(GROWTH[dimension](count))
+        return path
+
+    @functools.lru_cache(maxsize=None)
+    def instructions(self, source, *options):
+        """User instructions of a compilation."""
+        job = self.job(source, *options)
+        counted = measure.counted_by_processor(job) if self.processor_counts() else None
+        return counted or measure.counted_by_simulator(job)
+
+    @functools.lru_cache(maxsize=None)
+    def processor_counts(self):
+        """Whether the processor counts instructions here."""
+        return measure.counted_by_processor(measure.Job([self.empty], self.directory)) is not None
+
+    def output_size(self, source, *options):
+        """Bytes of the database."""
+        self.launcher.runs(self.job(source, *options), 1)
+        return (self.directory / "out.cdef").stat().st_size
+
+
+def say(text):
+    """Progress, away from the table."""
+    print(text, file=sys.stderr, flush=True)
+
+
+def peer_job(bench, peer):
+    """A peer with its input, in a directory of its own; and the size of its input."""
+    directory = bench.directory / peer.out
+    directory.mkdir()
+    peers.prepare(peer, directory, bench.plan.large)
+    job = measure.Job(peers.arguments(peer), directory, peer.out, peer.stdin, peer.stdout)
+    return job, (directory / peer.source).stat().st_size
+
+
+def throughput(bench):
+    """cdgen, its peers and the limits on the same definitions; returns the costs that other rows refer to."""
+    source = bench.source(MIXED, bench.plan.large)
+    jobs = {"cdgen": bench.job(source), "cdgen -s": bench.job(source, "-s"),
+            "wc -l": measure.Job(["wc", "-l", source], bench.directory),
+            "cp": measure.Job(["cp", source, "copy"], bench.directory, "copy")}
+    sizes = dict.fromkeys(jobs, source.stat().st_size)
+    for peer in peers.PEERS:
+        say(f"input for {peer.name}")
+        jobs[peer.name], sizes[peer.name] = peer_job(bench, peer)
+    say("cdgen and its peers")
+    costs = {name: measure.median(runs) for name, runs in bench.launcher.rounds(jobs, bench.plan.rounds).items()}
+    say("instructions")
+    for name, cost in costs.items():
+        options = ["-s"] if name == "cdgen -s" else []
+        counted = bench.instructions(source, *options) if name.startswith("cdgen") else None
+        bench.add(name, sizes[name], cost, counted)
+    return costs, sizes
+
+
+def judge_throughput(bench, costs, sizes):
+    """The targets of the mixed source."""
+    source, count = bench.source(MIXED, bench.plan.large), f"{bench.plan.large:,} mixed attributes"
+    cdgen = costs["cdgen"]
+    per_byte = bench.instructions(source) / sizes["cdgen"]
+    bench.add(f"instructions a byte, {count}", verdict=at_most(per_byte, 20, "{:.1f}"))
+    rates = {peer.name: sizes[peer.name] / costs[peer.name].cpu for peer in peers.PEERS}
+    fastest = max(rates, key=rates.get)
+    bench.add(f"speed against the fastest peer, {fastest}",
+              verdict=at_least(sizes["cdgen"] / cdgen.cpu / rates[fastest], 4, "{:.2f} x"))
+    bench.add("CPU time against wc -l", verdict=at_most(cdgen.cpu / costs["wc -l"].cpu, 15, "{:.1f} x"))
+    for option, name in (([], "cdgen"), (["-s"], "cdgen -s")):
+        bench.add(f"peak memory, {name}, {count}",
+                  verdict=memory(costs[name].peak, bench.output_size(source, *option)))
+    more = bench.instructions(source, "-s") / bench.instructions(source) - 1
+    bench.add("instructions that -s adds", verdict=at_most(100 * more, 25, "{:+.1f} %"))
+    bench.add("CPU time that -s adds", verdict=at_most(100 * (costs["cdgen -s"].cpu / cdgen.cpu - 1), 25, "{:+.1f} %"))
+
+
+def at_most(figure, limit, form):
+    """A figure that must not exceed its target."""
+    return Verdict(form.format(figure), f"<= {limit}", figure <= limit)
+
+
+def at_least(figure, limit, form):
+    """A figure that must reach its target."""
+    return Verdict(form.format(figure), f">= {limit}", figure >= limit)
+
+
+def memory(peak, output):
+    """Peak memory against the size of what is written."""
+    return Verdict(f"{peak / MB:.1f} MB for {output / MB:.1f} MB", "<= 2.2 x output + 2 MB", peak <= 2.2 * output + 2 * MB)
+
+
+def start_up(bench):
+    """A small compilation against a program that does nothing."""
+    say("start-up")
+    jobs = {"empty static program": measure.Job([bench.empty], bench.directory),
+            "cdgen, the example": bench.job(bench.example)}
+    costs = bench.launcher.rounds(jobs, bench.plan.start_rounds, bench.plan.start_runs)
+    empty, small = costs.values()
+    size = bench.example.stat().st_size
+    bench.add("empty static program", None, measure.median(empty))
+    bench.add("cdgen, the example", size, measure.median(small), bench.instructions(bench.example))
+    middle = measure.median(small).cpu / measure.median(empty).cpu
+    least = min(small).cpu / min(empty).cpu
+    bench.add("start-up against the empty program, median", verdict=at_most(middle, 1.8, "{:.2f} x"))
+    bench.add("start-up against the empty program, minimum", verdict=at_most(least, 1.8, "{:.2f} x"))
+    calls = measure.system_calls(bench.job(bench.example))
+    bench.add("system calls for the example", verdict=Verdict(str(calls), "< 40", calls < 40))
+
+
+def exponent(bench, dimension, *options):
+    """How instructions grow between the two sizes, without what one of the kind costs."""
+    base, small, large = (bench.instructions(bench.source(dimension, count), *options)
+                          for count in (1, bench.plan.small, bench.plan.large))
+    return math.log((large - base) / (small - base)) / math.log(bench.plan.large / bench.plan.small)
+
+
+def grow(bench, dimension):
+    """One dimension: its cost at the larger size, and its growth."""
+    say(f"growth: {dimension}")
+    source = bench.source(dimension, bench.plan.large)
+    runs = bench.launcher.runs(bench.job(source), bench.plan.rounds)
+    plain, reversed_order = exponent(bench, dimension), exponent(bench, dimension, "-s")
+    cost = measure.median(runs)
+    bench.add(f"{bench.plan.large:,} {dimension}", source.stat().st_size, cost, bench.instructions(source),
+              Verdict(f"grows by {plain:.3f}, with -s by {reversed_order:.3f}", "<= 1.02",
+                      max(plain, reversed_order) <= 1.02))
+    output = bench.output_size(source)
+    return (cost.peak - 2.2 * output, dimension, cost.peak, output)
+
+
+def growth(bench):
+    """All dimensions, and the one that takes the most memory beyond what its output allows."""
+    worst = max(grow(bench, dimension) for dimension in GROWTH)
+    bench.add(f"peak memory, worst of these: {worst[1]}", verdict=memory(*worst[2:]))
+
+
+def cells(row, wc_cpu, cdgen_cpu):
+    """The texts of a row."""
+    cost, size = row.cost, row.size
+    timed = [f"{cost.cpu * 1e3:.2f}", f"{cost.wall * 1e3:.2f}"] if cost else ["", ""]
+    rate = f"{size / cost.cpu / MB:.1f}" if cost and size else ""
+    per_byte = f"{row.instructions / size:.1f}" if row.instructions and size else ""
+    peak = f"{cost.peak / MB:.1f}" if cost else ""
+    ratios = [f"{cost.cpu / wc_cpu:.2f}", f"{cost.cpu / cdgen_cpu:.2f}"] if cost else ["", ""]
+    verdict = {None: "", True: "met", False: "MISSED"}[row.verdict.met]
+    return [row.name, f"{size / MB:.2f}" if size else "", *timed, rate, per_byte, peak, *ratios,
+            row.verdict.finding, row.verdict.target, verdict]
+
+
+TITLES = ["what", "source MB", "CPU ms", "wall ms", "MB/s", "instr/byte", "peak MB", "x wc -l", "x cdgen", "finding",
+          "target", "verdict"]
+
+
+def table(rows, costs):
+    """The table, in Markdown, its columns aligned."""
+    lines = [TITLES] + [cells(row, costs["wc -l"].cpu, costs["cdgen"].cpu) for row in rows]
+    widths = [max(map(len, column)) for column in zip(*lines)]
+    lines.insert(1, ["-" * width for width in widths])
+    return "\n".join("| " + " | ".join(map(str.ljust, line, widths)) + " |" for line in lines)
+
+
+def machine():
+    """What was measured on."""
+    try:
+        text = pathlib.Path("/proc/cpuinfo").read_text(encoding="ascii", errors="replace")
+        model = next(line.split(":")[1].strip() for line in text.splitlines() if line.startswith("model name"))
+    except (OSError, StopIteration):
+        model = platform.machine()
+    return f"{model}, {os.cpu_count()} processors, Linux {platform.release().split('-')[0]}"
+
+
+def run(bench):
+    """Everything; the costs that ratios refer to."""
+    costs, sizes = throughput(bench)
+    judge_throughput(bench, costs, sizes)
+    start_up(bench)
+    growth(bench)
+    return costs
+
+
+def parse():
+    """The command line."""
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--quick", action="store_true", help="small inputs and few runs: only to try it out")
+    parser.add_argument("--build", type=pathlib.Path, required=True, help="the build directory, with CDGEN_BENCH on")
+    parser.add_argument("--example", type=pathlib.Path, required=True, help="the source that start-up compiles")
+    return parser.parse_args()
+
+
+def main():
+    """Measure and print."""
+    options = parse()
+    os.environ["LC_ALL"] = "C"
+    with tempfile.TemporaryDirectory(prefix="cdgen-bench-") as directory:
+        bench = Bench(options.build.resolve(), options.example.resolve(), pathlib.Path(directory),
+                      QUICK if options.quick else FULL)
+        costs = run(bench)
+        counter = "the processor" if bench.processor_counts() else "valgrind"
+    print(f"{machine()}; instructions counted by {counter}; {bench.plan.large:,} definitions"
+          + ("; QUICK: rough figures" if options.quick else "") + "\n")
+    print(table(bench.rows, costs))
+    return 0
+
+
+if __name__ == "__main__":
+    try:
+        sys.exit(main())
+    except measure.Failure as failure:
+        sys.exit(f"bench: {failure}")

@@ -1,0 +1,115 @@
+"""What a run of a program costs: time and memory, user instructions, system calls."""
+
+import os
+import pathlib
+import re
+import statistics
+import subprocess
+import typing
+
+# The C library chooses its string functions by the processor; the plainest ones are there on all. Thresholds that it
+# takes from the sizes of caches are fixed too.
+SAME_EVERYWHERE = {
+    "GLIBC_TUNABLES": "glibc.cpu.hwcaps=-AVX512F,-AVX512VL,-AVX512BW,-AVX2,-AVX,-EVEX,-SSE4_2,-SSE4_1,-SSSE3,-ERMS,"
+                      "-FSRM,-BMI2,-MOVBE,-LZCNT,-POPCNT,-RTM,-FMA,-FMA4,-Fast_Unaligned_Copy,-Fast_Unaligned_Load,"
+                      "-Fast_Copy_Backward,-Fast_Rep_String,-Slow_BSF,-Prefer_No_VZEROUPPER,-Prefer_ERMS,-Prefer_FSRM,"
+                      "-Prefer_PMINUB_for_stringop,-AVX_Fast_Unaligned_Load"
+                      ":glibc.cpu.x86_non_temporal_threshold=0x1000000:glibc.cpu.x86_rep_movsb_threshold=0x1000000"
+                      ":glibc.cpu.x86_rep_stosb_threshold=0x1000000"}
+
+
+class Job(typing.NamedTuple):
+    """A command and its surroundings; what it makes anew is removed before each run."""
+
+    command: list
+    directory: pathlib.Path
+    fresh: str = "none"
+    stdin: str = "/dev/null"
+    stdout: str = "/dev/null"
+
+
+class Cost(typing.NamedTuple):
+    """Medians of several runs: seconds, and bytes at the peak."""
+
+    cpu: float
+    wall: float
+    peak: float
+
+
+class Failure(Exception):
+    """A program that was to be measured did not do its work."""
+
+
+def check(result, command):
+    """A run that failed has no cost."""
+    if result.returncode != 0:
+        detail = result.stderr.decode(errors="replace").strip()[-500:]
+        raise Failure(f"{' '.join(map(str, command))}: status {result.returncode}: {detail}")
+    return result
+
+
+class Launcher:
+    """Runs jobs with the helper program that measures them."""
+
+    def __init__(self, program):
+        self.program = program
+
+    def runs(self, job, count):
+        """The costs of a number of runs."""
+        command = [self.program, str(count), job.stdin, job.stdout, job.fresh, *job.command]
+        result = subprocess.run(command, cwd=job.directory, capture_output=True, check=False)
+        lines = check(result, job.command).stdout.decode().splitlines()
+        numbers = (map(int, line.split()) for line in lines)
+        return [Cost(cpu / 1e9, wall / 1e9, peak * 1024) for cpu, wall, peak in numbers]
+
+    def rounds(self, jobs, rounds, runs=1):
+        """All costs of each job, the jobs taking turns so that a busy spell hits all of them."""
+        costs = {name: [] for name in jobs}
+        for _ in range(rounds):
+            for name, job in jobs.items():
+                costs[name] += self.runs(job, runs)
+        return costs
+
+
+def median(costs):
+    """The middle of each figure of a list of costs."""
+    return Cost(*map(statistics.median, zip(*costs)))
+
+
+def quiet_run(command, job, environment):
+    """One run of a job under another program, with the job's streams."""
+    (job.directory / job.fresh).unlink(missing_ok=True)
+    with open(job.directory / job.stdin, "rb") as stdin, open(job.directory / job.stdout, "wb") as stdout:
+        result = subprocess.run([*command, *job.command], cwd=job.directory, stdin=stdin, stdout=stdout,
+                                stderr=subprocess.PIPE, env=dict(os.environ, **environment), check=False)
+    return check(result, job.command)
+
+
+def counted_by_processor(job):
+    """User instructions as the processor counts them; None where it is not allowed to, or is a virtual one."""
+    try:
+        result = quiet_run(["perf", "stat", "-x", ",", "-e", "instructions:u"], job, {})
+    except (Failure, FileNotFoundError):
+        return None
+    found = re.search(rb"^(\d+),.*instructions:u", result.stderr, re.MULTILINE)
+    return int(found[1]) if found else None
+
+
+def counted_by_simulator(job, environment=None):
+    """User instructions as valgrind's simulated processor counts them."""
+    path = job.directory / "callgrind.out"
+    quiet_run(["valgrind", "--tool=callgrind", f"--callgrind-out-file={path}"], job, environment or {})
+    found = re.search(r"^totals: (\d+)$", path.read_text(encoding="ascii", errors="replace"), re.MULTILINE)
+    path.unlink()
+    if not found:
+        raise Failure("valgrind wrote no total")
+    return int(found[1])
+
+
+def system_calls(job):
+    """The number of system calls of a run, its start included."""
+    path = job.directory / "strace.out"
+    quiet_run(["strace", "-f", "-qq", "-e", "signal=none", "-o", path], job, {})
+    calls = re.findall(r"^\d+ +\w+\(", path.read_text(encoding="ascii", errors="replace"), re.MULTILINE)
+    path.unlink()
+    return len(calls)

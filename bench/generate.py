@@ -123,17 +123,18 @@ def dynamic(kind, definition):
     """A dynamic attribute with a range and an initial value."""
     text = f"{kind}\n" + required(definition, "\tVariableType=Quantity\n")
     return text + (f"\tProperties={definition.properties[-1].replace('ReqdForDefine', 'QryReqsMonitoring')}\n"
-                   f"\tInitialValue={definition.default}\n\tRange={definition.low},{definition.high}\n")
+                   f"\tRange={definition.low},{definition.high}\n\tInitialValue={definition.default}\n")
 
 
-KINDS = (("PersistentResourceAttribute", persistent), ("DynamicClassAttribute", dynamic),
-         ("PersistentClassAttribute", persistent), ("DynamicResourceAttribute", dynamic))
+# Dynamic class attributes stand first, lest their ranges go to dynamic resource attributes that are still open.
+KINDS = (("DynamicClassAttribute", dynamic), ("DynamicResourceAttribute", dynamic),
+         ("PersistentClassAttribute", persistent), ("PersistentResourceAttribute", persistent))
 
 
 def attributes(count, _length):
-    """Attributes of all kinds and of many types, turn by turn."""
+    """Attributes of many types, a quarter of each kind."""
     for index, definition in enumerate(definitions(count)):
-        kind, write = KINDS[index % len(KINDS)]
+        kind, write = KINDS[index * len(KINDS) // count]
         yield write(kind, definition)
 
 

@@ -1,21 +1,20 @@
 """What a run of a program costs: time and memory, user instructions, system calls."""
 
-import os
 import pathlib
 import re
 import statistics
 import subprocess
 import typing
 
-# The C library chooses its string functions by the processor; the plainest ones are there on all. Thresholds that it
-# takes from the sizes of caches are fixed too.
-SAME_EVERYWHERE = {
-    "GLIBC_TUNABLES": "glibc.cpu.hwcaps=-AVX512F,-AVX512VL,-AVX512BW,-AVX2,-AVX,-EVEX,-SSE4_2,-SSE4_1,-SSSE3,-ERMS,"
-                      "-FSRM,-BMI2,-MOVBE,-LZCNT,-POPCNT,-RTM,-FMA,-FMA4,-Fast_Unaligned_Copy,-Fast_Unaligned_Load,"
-                      "-Fast_Copy_Backward,-Fast_Rep_String,-Slow_BSF,-Prefer_No_VZEROUPPER,-Prefer_ERMS,-Prefer_FSRM,"
-                      "-Prefer_PMINUB_for_stringop,-AVX_Fast_Unaligned_Load"
-                      ":glibc.cpu.x86_non_temporal_threshold=0x1000000:glibc.cpu.x86_rep_movsb_threshold=0x1000000"
-                      ":glibc.cpu.x86_rep_stosb_threshold=0x1000000"}
+# The C library chooses its string functions by the processor. Without these properties every x86-64 processor gets the
+# plainest ones. Thresholds that it takes from the sizes of caches are fixed too.
+PROCESSOR_PROPERTIES = ("AVX", "AVX2", "AVX512F", "AVX512BW", "AVX512VL", "BMI1", "BMI2", "ERMS", "FMA", "FMA4", "FSRM",
+                        "LZCNT", "MOVBE", "POPCNT", "RTM", "SSSE3", "SSE4_1", "SSE4_2", "AVX_Fast_Unaligned_Load",
+                        "Fast_Copy_Backward", "Fast_Rep_String", "Fast_Unaligned_Copy", "Fast_Unaligned_Load",
+                        "Slow_BSF")
+THRESHOLDS = ("x86_non_temporal_threshold", "x86_rep_movsb_threshold", "x86_rep_stosb_threshold")
+PLAINEST = ":".join(["glibc.cpu.hwcaps=" + ",".join(f"-{name}" for name in PROCESSOR_PROPERTIES)]
+                    + [f"glibc.cpu.{name}=0x1000000" for name in THRESHOLDS])
 
 
 class Job(typing.NamedTuple):
@@ -76,19 +75,19 @@ def median(costs):
     return Cost(*map(statistics.median, zip(*costs)))
 
 
-def quiet_run(command, job, environment):
-    """One run of a job under another program, with the job's streams."""
+def quiet_run(command, job, environment=None):
+    """One run of a job under another program, with the job's streams; in an environment of its own, if one is given."""
     (job.directory / job.fresh).unlink(missing_ok=True)
     with open(job.directory / job.stdin, "rb") as stdin, open(job.directory / job.stdout, "wb") as stdout:
         result = subprocess.run([*command, *job.command], cwd=job.directory, stdin=stdin, stdout=stdout,
-                                stderr=subprocess.PIPE, env=dict(os.environ, **environment), check=False)
+                                stderr=subprocess.PIPE, env=environment, check=False)
     return check(result, job.command)
 
 
 def counted_by_processor(job):
     """User instructions as the processor counts them; None where it is not allowed to, or is a virtual one."""
     try:
-        result = quiet_run(["perf", "stat", "-x", ",", "-e", "instructions:u"], job, {})
+        result = quiet_run(["perf", "stat", "-x", ",", "-e", "instructions:u"], job)
     except (Failure, FileNotFoundError):
         return None
     found = re.search(rb"^(\d+),.*instructions:u", result.stderr, re.MULTILINE)
@@ -98,7 +97,8 @@ def counted_by_processor(job):
 def counted_by_simulator(job, environment=None):
     """User instructions as valgrind's simulated processor counts them."""
     path = job.directory / "callgrind.out"
-    quiet_run(["valgrind", "--tool=callgrind", f"--callgrind-out-file={path}"], job, environment or {})
+    quiet_run(["valgrind", "--tool=callgrind", f"--callgrind-out-file={path}"], job,
+              environment)
     found = re.search(r"^totals: (\d+)$", path.read_text(encoding="ascii", errors="replace"), re.MULTILINE)
     path.unlink()
     if not found:
@@ -109,7 +109,7 @@ def counted_by_simulator(job, environment=None):
 def system_calls(job):
     """The number of system calls of a run, its start included."""
     path = job.directory / "strace.out"
-    quiet_run(["strace", "-f", "-qq", "-e", "signal=none", "-o", path], job, {})
+    quiet_run(["strace", "-f", "-qq", "-e", "signal=none", "-o", path], job)
     calls = re.findall(r"^\d+ +\w+\(", path.read_text(encoding="ascii", errors="replace"), re.MULTILINE)
     path.unlink()
     return len(calls)

@@ -258,6 +258,23 @@ def machine():
     return f"{model}, {os.cpu_count()} processors, Linux {platform.release().split('-')[0]}"
 
 
+BEGIN, END = "<!-- what script/bench --record wrote -->\n", "<!-- end -->\n"
+
+
+def record(path, text):
+    """Puts the table into a document, in place of the one that is there."""
+    document = path.read_text(encoding="utf-8")
+    before, rest = document.split(BEGIN)
+    path.write_text(before + BEGIN + text + "\n" + END + rest.split(END)[1], encoding="utf-8")
+
+
+def report(bench, costs, quick):
+    """What was measured on, and the table."""
+    counter = "the processor" if bench.processor_counts() else "valgrind"
+    head = f"{machine()}; instructions counted by {counter}; {bench.plan.large:,} definitions"
+    return head + ("; QUICK: rough figures" if quick else "") + "\n\n" + table(bench.rows, costs)
+
+
 def run(bench):
     """Everything; the costs that ratios refer to."""
     costs, sizes = throughput(bench)
@@ -271,6 +288,8 @@ def parse():
     """The command line."""
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--quick", action="store_true", help="small inputs and few runs: only to try it out")
+    parser.add_argument("--record", action="store_true", help="put the table into the document too")
+    parser.add_argument("--document", type=pathlib.Path, required=True)
     parser.add_argument("--build", type=pathlib.Path, required=True, help="the build directory, with CDGEN_BENCH on")
     parser.add_argument("--example", type=pathlib.Path, required=True, help="the source that start-up compiles")
     return parser.parse_args()
@@ -283,11 +302,10 @@ def main():
     with tempfile.TemporaryDirectory(prefix="cdgen-bench-") as directory:
         bench = Bench(options.build.resolve(), options.example.resolve(), pathlib.Path(directory),
                       QUICK if options.quick else FULL)
-        costs = run(bench)
-        counter = "the processor" if bench.processor_counts() else "valgrind"
-    print(f"{machine()}; instructions counted by {counter}; {bench.plan.large:,} definitions"
-          + ("; QUICK: rough figures" if options.quick else "") + "\n")
-    print(table(bench.rows, costs))
+        text = report(bench, run(bench), options.quick)
+    print(text)
+    if options.record:
+        record(options.document, text)
     return 0
 
 

@@ -174,7 +174,8 @@ def valid_values(count, _length):
 
 def varieties(count, _length):
     """One attribute's list of varieties."""
-    return listing("Varied", "UInt32", (f"\tVarietyRange={100000 + index},{200000 + index}\n" for index in range(count)))
+    return listing("Varied", "UInt32", (f"\tVarietyRange={100000 + index},{200000 + index}\n"
+                                        for index in range(count)))
 
 
 def array_defaults(count, _length):

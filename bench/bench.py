@@ -81,8 +81,12 @@ class Bench:
         self.rows.append(Row(*args, **kwargs))
 
     def job(self, source, *options):
-        """cdgen on a source of the directory."""
-        return measure.Job([self.cdgen, *options, source, "out.cdef"], self.directory, "out.cdef")
+        """cdgen on a source."""
+        return self.here([self.cdgen, *options, source, "out.cdef"], fresh="out.cdef")
+
+    def here(self, command, **more):
+        """A command of the directory that takes little time."""
+        return measure.Job(command, self.directory, repeat=self.plan.rounds, **more)
 
     @functools.lru_cache(maxsize=None)
     def source(self, dimension, count):
@@ -102,11 +106,11 @@ class Bench:
     @functools.lru_cache(maxsize=None)
     def processor_counts(self):
         """Whether the processor counts instructions here."""
-        return measure.counted_by_processor(measure.Job([self.empty], self.directory)) is not None
+        return measure.counted_by_processor(self.here([self.empty])) is not None
 
     def output_size(self, source, *options):
         """Bytes of the database."""
-        self.launcher.runs(self.job(source, *options), 1)
+        self.launcher.runs(self.job(source, *options)._replace(repeat=1))
         return (self.directory / "out.cdef").stat().st_size
 
 
@@ -128,8 +132,7 @@ def throughput(bench):
     """cdgen, its peers and the limits on the same definitions; returns the costs that other rows refer to."""
     source = bench.source(MIXED, bench.plan.large)
     jobs = {"cdgen": bench.job(source), "cdgen -s": bench.job(source, "-s"),
-            "wc -l": measure.Job(["wc", "-l", source], bench.directory),
-            "cp": measure.Job(["cp", source, "copy"], bench.directory, "copy")}
+            "wc -l": bench.here(["wc", "-l", source]), "cp": bench.here(["cp", source, "copy"], fresh="copy")}
     sizes = dict.fromkeys(jobs, source.stat().st_size)
     for peer in peers.PEERS:
         say(f"input for {peer.name}")
@@ -181,9 +184,8 @@ def memory(peak, output):
 def start_up(bench):
     """A small compilation against a program that does nothing."""
     say("start-up")
-    jobs = {"empty static program": measure.Job([bench.empty], bench.directory),
-            "cdgen, the example": bench.job(bench.example)}
-    costs = bench.launcher.rounds(jobs, bench.plan.start_rounds, bench.plan.start_runs)
+    jobs = [job._replace(repeat=bench.plan.start_runs) for job in (bench.here([bench.empty]), bench.job(bench.example))]
+    costs = bench.launcher.rounds(dict(enumerate(jobs)), bench.plan.start_rounds)
     empty, small = costs.values()
     size = bench.example.stat().st_size
     bench.add("empty static program", None, measure.median(empty))
@@ -207,7 +209,7 @@ def grow(bench, dimension):
     """One dimension: its cost at the larger size, and its growth; returns what to say of its memory."""
     say(f"growth: {dimension}")
     source = bench.source(dimension, bench.plan.large)
-    runs = bench.launcher.runs(bench.job(source), bench.plan.rounds)
+    runs = bench.launcher.runs(bench.job(source))
     plain, reversed_order = exponent(bench, dimension), exponent(bench, dimension, "-s")
     cost = measure.median(runs)
     bench.add(f"{bench.plan.large:,} {dimension}", source.stat().st_size, cost, bench.instructions(source),

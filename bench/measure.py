@@ -18,13 +18,17 @@ PLAINEST = ":".join(["glibc.cpu.hwcaps=" + ",".join(f"-{name}" for name in PROCE
 
 
 class Job(typing.NamedTuple):
-    """A command and its surroundings; what it makes anew is removed before each run."""
+    """A command and its surroundings; what it makes anew is removed before each run.
+
+    repeat: runs in a row when it is its turn; the shorter a program runs, the more it takes to tell.
+    """
 
     command: list
     directory: pathlib.Path
     fresh: str = "none"
     stdin: str = "/dev/null"
     stdout: str = "/dev/null"
+    repeat: int = 1
 
 
 class Cost(typing.NamedTuple):
@@ -53,20 +57,20 @@ class Launcher:
     def __init__(self, program):
         self.program = program
 
-    def runs(self, job, count):
-        """The costs of a number of runs."""
-        command = [self.program, str(count), job.stdin, job.stdout, job.fresh, *job.command]
+    def runs(self, job):
+        """The costs of its runs in a row."""
+        command = [self.program, str(job.repeat), job.stdin, job.stdout, job.fresh, *job.command]
         result = subprocess.run(command, cwd=job.directory, capture_output=True, check=False)
         lines = check(result, job.command).stdout.decode().splitlines()
         numbers = (map(int, line.split()) for line in lines)
         return [Cost(cpu / 1e9, wall / 1e9, peak * 1024) for cpu, wall, peak in numbers]
 
-    def rounds(self, jobs, rounds, runs=1):
+    def rounds(self, jobs, rounds):
         """All costs of each job, the jobs taking turns so that a busy spell hits all of them."""
         costs = {name: [] for name in jobs}
         for _ in range(rounds):
             for name, job in jobs.items():
-                costs[name] += self.runs(job, runs)
+                costs[name] += self.runs(job)
         return costs
 
 

@@ -197,7 +197,8 @@ def bdf(count):
                    d.number + 1)
         rows = "".join(f"{value:08X}\n" for value in numbers)
         yield (f"STARTCHAR {d.name}\nENCODING {index}\n"
-               f"SWIDTH {d.description % 1000} 0\nDWIDTH {1 + d.display % 100} 0\nBBX 32 8 0 0\nBITMAP\n{rows}ENDCHAR\n")
+               f"SWIDTH {d.description % 1000} 0\nDWIDTH {1 + d.display % 100} 0\n"
+               f"BBX 32 8 0 0\nBITMAP\n{rows}ENDCHAR\n")
     yield "ENDFONT\n"
 
 

@@ -154,6 +154,8 @@ int oct_convert(cdgen &cx, const char *p, int type, char *out_buf);
 /* The text inside a pair of double quotes; s itself when it is not quoted; null when the quotes do not match. Writes a
  * NUL over the closing quote. */
 char *strip_quotes(char *s);
+/* The same for a text that is known to end, with a NUL, at *end, which becomes the end of what is returned. */
+char *strip_quotes(char *s, char **end);
 /* ORs the bits of the properties named in a comma-separated list, which it takes apart, into *dest. An unknown name is
  * fatal. */
 void set_props(cdgen &cx, vx_uint32_t *dest, const props_t *props, int len, char *vnoq);
@@ -352,6 +354,8 @@ struct fatal_exit {
     int code;            /* exit status */
 };
 
+constexpr size_t SOURCE_BUFFER = 65536; /* bytes asked for by one read */
+
 /* The source while it is read; closes itself. */
 struct source_file {
     source_file() = default;
@@ -366,9 +370,11 @@ struct source_file {
     int fd = -1;
     dev_t device = 0;
     ino_t inode = 0;
-    size_t pos = 0; /* of the first byte of buffer not yet taken */
-    size_t end = 0; /* of the first byte of buffer not yet filled */
-    std::array<char, 65536> buffer;
+    size_t pos = 0;           /* of the first byte of buffer not yet taken */
+    size_t end = 0;           /* of the first byte of buffer not yet filled, which is a NUL */
+    char *mark = nullptr;     /* in buffer, and */
+    char *cut_mark = nullptr; /* in a cut line: what may end a text and has not been looked at */
+    std::array<char, SOURCE_BUFFER + 1> buffer;
 };
 
 constexpr size_t LOCATOR_SIZE = 1798; /* the longest value and its NUL */
@@ -421,9 +427,9 @@ struct cdgen {
 
     /* Source reader */
     source_file cdb_fp;
-    char inbuf[256] = {};
-    int linenum = 0; /* reads made; a line of more than 254 characters takes several */
-    int linepos = 0; /* column, from 1 */
+    char inbuf[256] = {}; /* a line that has no newline behind it in the buffer */
+    int linenum = 0;      /* reads made; a line of more than 254 characters takes several */
+    int linepos = 0;      /* column, from 1 */
     int table_id = -1;
     const srtable_ctrl *scp = nullptr;
     const srtable_ctrl *prev_scp = nullptr;

@@ -8,33 +8,35 @@ namespace {
 
 constexpr size_t VALUE_MAX_CHARS = LOCATOR_SIZE - 1;
 
-/* The name and value of a line, the name ended by a NUL; no value when there is nothing to store. */
+/* The name and value of a line, each ended by a NUL; no value when there is nothing to store. */
 struct name_value {
     std::string_view name;
     char *value;
+    size_t length;
 };
 
-name_value split_line(cdgen &cx, char *il) {
+name_value split_line(cdgen &cx, char *il, char *end) {
     char *name = il;
     while (*name == ' ' || *name == '\t')
         ++name;
     cx.linepos = 1 + static_cast<int>(name - il);
-    if (*name == '\0')
+    if (name == end)
         return {};
-    char *equals = strchr(name, '=');
+    auto *equals = static_cast<char *>(memchr(name, '=', static_cast<size_t>(end - name)));
     if (equals == nullptr)
         source_error(cx, "Missing '=' after attribute name");
     *equals = '\0';
     char *value = equals + 1;
     if (strcmp(value, "\"\"") == 0)
         return {};
-    char *unquoted = strip_quotes(value);
+    char *unquoted = strip_quotes(value, &end);
     if (unquoted == nullptr)
         source_error(cx, "Unmatched double quotes for attribute: ", name);
-    if (strlen(unquoted) > VALUE_MAX_CHARS)
+    auto length = static_cast<size_t>(end - unquoted);
+    if (length > VALUE_MAX_CHARS)
         source_error(cx, "Attibute value exceeds maximum length: ", name); /* deliberately spelled so */
     cx.linepos = 1 + static_cast<int>(unquoted - il);
-    return {{name, static_cast<size_t>(equals - name)}, unquoted};
+    return {{name, static_cast<size_t>(equals - name)}, unquoted, length};
 }
 
 const table_attrs &known_attr(cdgen &cx, const srtable_ctrl &scp, std::string_view name) {
@@ -65,7 +67,11 @@ void count_required(cdgen &cx, stanza_state &state, const table_attrs &attr) {
 } // namespace
 
 void save_attr(cdgen &cx, char *il, int table_id) {
-    auto [name, value] = split_line(cx, il);
+    save_attr_line(cx, il, il + strlen(il), table_id);
+}
+
+void save_attr_line(cdgen &cx, char *il, char *end, int table_id) {
+    auto [name, value, length] = split_line(cx, il, end);
     if (value == nullptr)
         return;
     const srtable_ctrl &scp = sc_tables[static_cast<size_t>(table_id)];
@@ -77,11 +83,11 @@ void save_attr(cdgen &cx, char *il, int table_id) {
     }
     if (cx.debugLevel >= 2)
         printf("%s: found attr: \"%s\", value: \"%s\",length: %d\n", scp.sc_name, attr.ta_name, value,
-               static_cast<int>(strlen(value)));
+               static_cast<int>(length));
     if ((attr.req_bit & OPTIONAL) != 0)
         count_optional(cx, scp, state, attr);
     else
         count_required(cx, state, attr);
     cx.line_texts.clear();
-    store_value({cx, scp, state, static_cast<char *>(scp.sc_cb(cx)), attr, value});
+    store_value({cx, scp, state, static_cast<char *>(scp.sc_cb(cx)), attr, value, length});
 }

@@ -12,7 +12,11 @@ struct attr_line {
     char *record; /* the kind's staging record */
     const table_attrs &attr;
     char *value; /* not empty; may be taken apart */
+    size_t length = strlen(value);
 };
+
+/* What save_attr does, for a line that is known to end, with a NUL, at end. */
+void save_attr_line(cdgen &cx, char *il, char *end, int table_id);
 
 /* Converts the value and stores it, by the attribute's type. */
 void store_value(const attr_line &line);

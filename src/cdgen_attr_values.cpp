@@ -47,7 +47,7 @@ template <class Width> void store_integer(const attr_line &line) {
 }
 
 void store_string(const attr_line &line) {
-    store(field_of(line), add_to_tbl(line.cx, strings_of(line), line.value, strlen(line.value) + 1));
+    store(field_of(line), add_to_tbl(line.cx, strings_of(line), line.value, line.length + 1));
 }
 
 void store_props(const attr_line &line, const props_t *props, int count) {
@@ -112,7 +112,7 @@ void store_manager(const attr_line &line) {
 
 void store_locator(const attr_line &line) {
     line.cx._rc_locator.ptr = &line.cx.cb_rsrc_class.rc_locator;
-    memcpy(line.cx._rc_locator.name, line.value, strlen(line.value) + 1);
+    memcpy(line.cx._rc_locator.name, line.value, line.length + 1);
 }
 
 void ignore(const attr_line &) {}
@@ -280,7 +280,7 @@ void store_range(const attr_line &line) {
 /* ---- Elements of structured data ------------------------------------------------------------------------------- */
 
 void store_sd_name(const attr_line &line) {
-    cdb_ref_t name = {{add_to_tbl(line.cx, strings_of(line), line.value, strlen(line.value) + 1), 0}};
+    cdb_ref_t name = {{add_to_tbl(line.cx, strings_of(line), line.value, line.length + 1), 0}};
     store(field_of(line), name);
     line.cx.sd_name_found = 1;
 }

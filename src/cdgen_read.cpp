@@ -1,6 +1,6 @@
 /* cdgen_read.cpp: reads the source line by line, removes comments, and frames stanzas. */
 
-#include "cdgen.h"
+#include "cdgen_attr.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -23,103 +23,103 @@ void open_source(cdgen &cx, const char *filename) {
     source.inode = st.st_ino;
 }
 
-/* More bytes into an empty buffer; false at the end of the file. */
+/* What may end a line's text before its newline: quotes and comments, and the NUL behind the last byte. They are rare.
+ * Where the next one stands is found once, however many lines stand before it. */
+char *next_mark(char *from) {
+    return from + strcspn(from, "\"#/");
+}
+
+/* Moves a line's beginning to the front of the buffer and reads what follows; false at the end of the file. */
 bool refill(cdgen &cx) {
     source_file &source = cx.cdb_fp;
+    size_t begun = source.end - source.pos;
+    memmove(source.buffer.data(), source.buffer.data() + source.pos, begun);
     ssize_t n = 0;
     do
-        n = read(source.fd, source.buffer.data(), source.buffer.size());
+        n = read(source.fd, source.buffer.data() + begun, SOURCE_BUFFER - begun);
     while (n < 0 && errno == EINTR);
     if (n < 0) {
         int error = errno;
         cdgen_error_exit(cx, cx.cdefsrc, ": cannot read because: ", strerror(error), 0, error);
     }
     source.pos = 0;
-    source.end = static_cast<size_t>(n);
+    source.end = begun + static_cast<size_t>(n);
+    source.buffer[source.end] = '\0';
+    source.mark = next_mark(source.buffer.data());
     return n > 0;
 }
 
-/* The next line, with its newline, or the next 254 characters of a longer one, into cx.inbuf; false at the end. */
-bool read_line(cdgen &cx) {
-    source_file &source = cx.cdb_fp;
-    size_t length = 0;
-    while (length < LINE_MAX_CHARS) {
-        if (source.pos == source.end && !refill(cx))
-            break;
-        const char *from = source.buffer.data() + source.pos;
-        size_t there = std::min(LINE_MAX_CHARS - length, source.end - source.pos);
-        const void *newline = memchr(from, '\n', there);
-        size_t taken = newline == nullptr ? there : static_cast<size_t>(static_cast<const char *>(newline) - from) + 1;
-        memcpy(cx.inbuf + length, from, taken);
-        source.pos += taken;
-        length += taken;
-        if (newline != nullptr)
-            break;
-    }
-    cx.inbuf[length] = '\0';
-    return length > 0;
+/* A line where it stands: the place of its newline is its end. What has none is copied to where it may be cut. */
+struct source_line {
+    char *begin; /* null: there is no more */
+    char *end;
+    char *&mark; /* the first mark from begin on; at or behind end if the line has none */
+};
+
+source_line whole_line(source_file &source, char *begin, char *newline) {
+    source.pos += static_cast<size_t>(newline - begin) + 1;
+    if (source.mark < begin)
+        source.mark = next_mark(begin);
+    return {begin, newline, source.mark};
 }
 
-/* What a character means to the search for a line's end; most mean nothing but that there is text. */
-enum char_class : char { TEXT, BLANK, QUOTE, HASH, SLASH, END };
+source_line cut_line(cdgen &cx, const char *begin, size_t length) {
+    cx.cdb_fp.pos += length;
+    memcpy(cx.inbuf, begin, length);
+    cx.inbuf[length] = '\0';
+    cx.cdb_fp.cut_mark = next_mark(cx.inbuf);
+    return {cx.inbuf, cx.inbuf + length, cx.cdb_fp.cut_mark};
+}
 
-constexpr std::array<char_class, 256> char_classes = [] {
-    std::array<char_class, 256> classes = {};
-    classes['\0'] = classes['\n'] = END;
-    classes[' '] = classes['\t'] = BLANK;
-    classes['"'] = QUOTE;
-    classes['#'] = HASH;
-    classes['/'] = SLASH;
-    return classes;
-}();
+/* The next line, or the next 254 characters of a longer one. */
+source_line next_line(cdgen &cx) {
+    source_file &source = cx.cdb_fp;
+    for (;;) {
+        char *begin = source.buffer.data() + source.pos;
+        size_t there = std::min(LINE_MAX_CHARS, source.end - source.pos);
+        if (void *newline = memchr(begin, '\n', there))
+            return whole_line(source, begin, static_cast<char *>(newline));
+        if (there == LINE_MAX_CHARS || (!refill(cx) && there > 0))
+            return cut_line(cx, source.buffer.data() + source.pos, there);
+        if (source.end == 0)
+            return {nullptr, nullptr, source.mark};
+    }
+}
 
-char_class class_of(char c) {
-    return char_classes[static_cast<unsigned char>(c)];
+bool is_blank(char c) {
+    return c == ' ' || c == '\t';
 }
 
 /* Where the text of a line ends: at its newline, its comment, or its NUL. Null for a line without text: blanks, quotes
  * and comments are none. */
-char *end_of_text(char *line) {
+char *end_of_text(const source_line &line) {
     bool text_seen = false;
     bool quoted = false;
-    for (char *p = line;; ++p) {
-        switch (class_of(*p)) {
-        case END:
-            return text_seen ? p : nullptr;
-        case BLANK:
-            break;
-        case QUOTE:
-            quoted = !quoted;
-            break;
-        case HASH:
-            if (!text_seen)
-                return nullptr;
-            if (!quoted)
-                return p;
-            break;
-        case SLASH:
-            if (p[1] != '/' && p[1] != '*')
-                text_seen = true;
-            else if (!quoted)
-                return text_seen ? p : nullptr;
-            break;
-        case TEXT:
-            text_seen = true;
-            while (class_of(p[1]) == TEXT)
-                ++p;
-        }
+    char *&mark = line.mark;
+    for (char *p = line.begin;; p = mark + 1, mark = next_mark(p)) {
+        while (!text_seen && is_blank(*p))
+            ++p;
+        text_seen = text_seen || p < std::min(mark, line.end);
+        if (mark >= line.end)
+            return text_seen ? line.end : nullptr;
+        bool comment = *mark == '#' || (*mark == '/' && (mark[1] == '/' || mark[1] == '*'));
+        if (*mark == '\0' || (comment && !quoted) || (*mark == '#' && !text_seen))
+            return text_seen ? mark : nullptr;
+        quoted = quoted != (*mark == '"');
+        text_seen = text_seen || (*mark == '/' && !comment);
     }
 }
 
-/* Cuts off what is no text; false if nothing is left. Hash signs at the end go even inside quotes. */
-bool strip_line(char *line) {
+/* Cuts off what is no text and returns the end; null if nothing is left. Hash signs at the end go even inside quotes.
+ */
+char *strip_line(const source_line &line) {
     char *end = end_of_text(line);
     if (end == nullptr)
-        return false;
-    while (end > line && (end[-1] == ' ' || end[-1] == '\t' || end[-1] == '#'))
+        return nullptr;
+    while (is_blank(end[-1]) || end[-1] == '#') /* there is text in front */
         --end;
     *end = '\0';
-    return true;
+    return end;
 }
 
 bool class_is_open(const cdgen &cx) {
@@ -227,17 +227,21 @@ int above_stdio(int fd) {
 void cache_input_data(cdgen &cx, const char *filename) {
     open_source(cx, filename);
     cx.table_id = -1;
-    while (read_line(cx)) {
+    for (;;) {
+        source_line line = next_line(cx);
+        if (line.begin == nullptr)
+            break;
         if (cx.linenum < std::numeric_limits<int>::max())
             ++cx.linenum;
-        if (!strip_line(cx.inbuf))
+        char *end = strip_line(line);
+        if (end == nullptr)
             continue;
-        if (cx.inbuf[0] != ' ' && cx.inbuf[0] != '\t')
-            begin_stanza(cx, cx.inbuf);
+        if (!is_blank(*line.begin))
+            begin_stanza(cx, line.begin);
         else if (cx.table_id < 0)
             source_error(cx, "Attribute found but no table defined yet");
         else
-            save_attr(cx, cx.inbuf, cx.table_id);
+            save_attr_line(cx, line.begin, end, cx.table_id);
     }
     cx.cdb_fp.close();
 }

@@ -267,15 +267,21 @@ int oct_convert(cdgen &cx, const char *p, int type, char *out_buf) {
 char *strip_quotes(char *s) {
     if (s == nullptr)
         return nullptr;
+    char *end = s + strlen(s);
+    return strip_quotes(s, &end);
+}
+
+char *strip_quotes(char *s, char **end) {
     char *open = s;
     while (*open == ' ' || *open == '\t')
         ++open;
     if (*open != '"')
         return s;
-    char *close = open + strlen(open) - 1;
+    char *close = *end - 1;
     if (*close != '"' || (close > s && close[-1] == '\\'))
         return nullptr;
     *close = '\0';
+    *end = close;
     return open == close ? open : open + 1;
 }
 

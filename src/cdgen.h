@@ -274,6 +274,7 @@ struct table_attrs {
     int ta_offset;       /* of the field in the stanza's staging record */
     vx_uint32_t req_bit; /* the attribute's bit in req_mask or, with OPTIONAL added, in opt_mask */
     int dup_allowed;     /* may stand several times in one stanza */
+    size_t ta_length = std::string_view(ta_name).size();
 };
 
 /* What sets the four attribute kinds apart while their lines are parsed. */
@@ -435,6 +436,7 @@ struct cdgen {
     const srtable_ctrl *prev_scp = nullptr;
     const srtable_ctrl *curr_sd_scp = nullptr; /* of the latest header */
     std::array<stanza_state, SC_COUNT> stanzas;
+    stanza_state *state = nullptr; /* that of scp */
 
     /* Staging records */
     rsrc_class_t cb_rsrc_class = {};

@@ -15,11 +15,10 @@ struct name_value {
     size_t length;
 };
 
-name_value split_line(cdgen &cx, char *il, char *end) {
-    char *name = il;
-    while (*name == ' ' || *name == '\t')
-        ++name;
-    cx.linepos = 1 + static_cast<int>(name - il);
+name_value split_line(cdgen &cx, const attr_text &text) {
+    char *name = text.name;
+    char *end = text.end;
+    cx.linepos = 1 + static_cast<int>(name - text.line);
     if (name == end)
         return {};
     auto *equals = static_cast<char *>(memchr(name, '=', static_cast<size_t>(end - name)));
@@ -35,7 +34,7 @@ name_value split_line(cdgen &cx, char *il, char *end) {
     auto length = static_cast<size_t>(end - unquoted);
     if (length > VALUE_MAX_CHARS)
         source_error(cx, "Attibute value exceeds maximum length: ", name); /* deliberately spelled so */
-    cx.linepos = 1 + static_cast<int>(unquoted - il);
+    cx.linepos = 1 + static_cast<int>(unquoted - text.line);
     return {{name, static_cast<size_t>(equals - name)}, unquoted, length};
 }
 
@@ -67,15 +66,15 @@ void count_required(cdgen &cx, stanza_state &state, const table_attrs &attr) {
 } // namespace
 
 void save_attr(cdgen &cx, char *il, int table_id) {
-    save_attr_line(cx, il, il + strlen(il), table_id);
+    auto kind = static_cast<size_t>(table_id);
+    char *name = il + strspn(il, " \t");
+    save_attr_line(cx, {il, name, name + strlen(name)}, sc_tables[kind], cx.stanzas[kind]);
 }
 
-void save_attr_line(cdgen &cx, char *il, char *end, int table_id) {
-    auto [name, value, length] = split_line(cx, il, end);
+void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, stanza_state &state) {
+    auto [name, value, length] = split_line(cx, text);
     if (value == nullptr)
         return;
-    const srtable_ctrl &scp = sc_tables[static_cast<size_t>(table_id)];
-    stanza_state &state = cx.stanzas[static_cast<size_t>(table_id)];
     const table_attrs &attr = known_attr(cx, scp, name);
     if (*value == '\0') {
         printf("In file %s: ", cx.cdefsrc);

@@ -15,8 +15,15 @@ struct attr_line {
     size_t length = strlen(value);
 };
 
-/* What save_attr does, for a line that is known to end, with a NUL, at end. */
-void save_attr_line(cdgen &cx, char *il, char *end, int table_id);
+/* An attribute line of which is known where its name begins, behind the blanks, and where it ends, with a NUL. */
+struct attr_text {
+    char *line;
+    char *name;
+    char *end;
+};
+
+/* What save_attr does. */
+void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, stanza_state &state);
 
 /* Converts the value and stores it, by the attribute's type. */
 void store_value(const attr_line &line);

@@ -287,5 +287,5 @@ const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name) {
     if (at < 0)
         return nullptr;
     const table_attrs &attr = scp.sc_attrs[static_cast<size_t>(at)];
-    return name == attr.ta_name ? &attr : nullptr;
+    return name.size() == attr.ta_length && memcmp(name.data(), attr.ta_name, attr.ta_length) == 0 ? &attr : nullptr;
 }

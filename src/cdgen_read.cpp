@@ -90,13 +90,13 @@ bool is_blank(char c) {
     return c == ' ' || c == '\t';
 }
 
-/* Where the text of a line ends: at its newline, its comment, or its NUL. Null for a line without text: blanks, quotes
- * and comments are none. */
-char *end_of_text(const source_line &line) {
+/* Where the text of a line that has marks ends: at its newline, its comment, or its NUL. Null for a line without text:
+ * blanks, quotes and comments are none. */
+char *end_by_marks(const source_line &line, char *p) {
     bool text_seen = false;
     bool quoted = false;
-    char *&mark = line.mark;
-    for (char *p = line.begin;; p = mark + 1, mark = next_mark(p)) {
+    for (;; p = line.mark + 1, line.mark = next_mark(p)) {
+        char *mark = line.mark;
         while (!text_seen && is_blank(*p))
             ++p;
         text_seen = text_seen || p < std::min(mark, line.end);
@@ -110,16 +110,23 @@ char *end_of_text(const source_line &line) {
     }
 }
 
-/* Cuts off what is no text and returns the end; null if nothing is left. Hash signs at the end go even inside quotes.
- */
-char *strip_line(const source_line &line) {
-    char *end = end_of_text(line);
+/* A line's text: what is left without comment, and without blanks and hash signs at the end, even quoted ones. */
+struct line_text {
+    char *begin; /* behind the blanks at the line's beginning */
+    char *end;   /* null for a line without text; else a NUL stands there */
+};
+
+line_text text_of(const source_line &line) {
+    char *begin = line.begin;
+    while (is_blank(*begin))
+        ++begin;
+    char *end = line.mark < line.end ? end_by_marks(line, begin) : begin < line.end ? line.end : nullptr;
     if (end == nullptr)
-        return nullptr;
+        return {};
     while (is_blank(end[-1]) || end[-1] == '#') /* there is text in front */
         --end;
     *end = '\0';
-    return end;
+    return {begin, end};
 }
 
 bool class_is_open(const cdgen &cx) {
@@ -200,7 +207,8 @@ void begin_stanza(cdgen &cx, const char *name) {
         source_error(cx, "Invalid table name: ", name);
     cx.prev_scp = cx.scp;
     cx.scp = cx.curr_sd_scp = &sc_tables[static_cast<size_t>(cx.table_id)];
-    if (is_SD_stanza(cx.table_id))
+    cx.state = &state_of(cx, cx.scp);
+    if (cx.scp->sc_sd_owner != nullptr)
         begin_sd_stanza(cx);
     else
         begin_plain_stanza(cx);
@@ -233,15 +241,15 @@ void cache_input_data(cdgen &cx, const char *filename) {
             break;
         if (cx.linenum < std::numeric_limits<int>::max())
             ++cx.linenum;
-        char *end = strip_line(line);
+        auto [begin, end] = text_of(line);
         if (end == nullptr)
             continue;
-        if (!is_blank(*line.begin))
-            begin_stanza(cx, line.begin);
+        if (begin == line.begin)
+            begin_stanza(cx, begin);
         else if (cx.table_id < 0)
             source_error(cx, "Attribute found but no table defined yet");
         else
-            save_attr_line(cx, line.begin, end, cx.table_id);
+            save_attr_line(cx, {line.begin, begin, end}, *cx.scp, *cx.state);
     }
     cx.cdb_fp.close();
 }

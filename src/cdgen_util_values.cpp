@@ -40,6 +40,10 @@ const char *plain_decimal(const char *text, vx_uint64_t *value) {
     return p;
 }
 
+[[gnu::noinline]] long library_integer(cdgen &cx, const char *text, char **end, int base) {
+    return converted(cx, [&] { return strtol(text, end, base); });
+}
+
 /* The whole text as a decimal integer: false when anything else follows. */
 bool whole_signed(cdgen &cx, const char *text, vx_int64_t *value) {
     vx_uint64_t plain = 0;
@@ -209,13 +213,13 @@ int is_vx_array(vx_data_type_t dt) {
 
 long int_from_text(cdgen &cx, const char *text, char **end, int base) {
     vx_uint64_t plain = 0;
-    bool decimal = base == 10 || (base == 0 && text[0] != '0');
-    if (const char *after = decimal ? plain_decimal(text, &plain) : nullptr) {
-        if (end != nullptr)
-            *end = const_cast<char *>(after);
-        return static_cast<long>(plain);
-    }
-    return converted(cx, [&] { return strtol(text, end, base); });
+    bool decimal = base == 10 || (base == 0 && (text[0] != '0' || text[1] == '\0'));
+    const char *after = decimal ? plain_decimal(text, &plain) : nullptr;
+    if (after == nullptr)
+        return library_integer(cx, text, end, base);
+    if (end != nullptr)
+        *end = const_cast<char *>(after);
+    return static_cast<long>(plain);
 }
 
 int str_to_vx(cdgen &cx, vx_value_t *vx_out, vx_data_type_t vx_type, const char *str_in, text_pool &pool) {
@@ -292,7 +296,7 @@ void set_props(cdgen &cx, vx_uint32_t *dest, const props_t *props, int len, char
         if (*name == '\0') /* an empty field */
             continue;
         const props_t *known = props;
-        while (known < props + len && strcmp(known->s, name) != 0)
+        while (known < props + len && (known->s[0] != name[0] || strcmp(known->s, name) != 0))
             ++known;
         if (known == props + len)
             cdgen_error_exit(cx, name, ": invalid property", nullptr, 0, 1);

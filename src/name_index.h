@@ -14,8 +14,8 @@ public:
 
     constexpr name_index() = default;
 
-    /* name_of(i), for i below count, are the names; at most 64, no two alike in length and in the first and last
-     * character and those a third and a half of the way. (If two are, the search for a multiplier does not end, and the
+    /* name_of(i), for i below count, are the names; at most 64, no two alike in length and in the first, the
+     * middle and the last character. (If two are, the search for a multiplier does not end, and the
      * compiler says so.) */
     template <class NameOf> consteval name_index(std::size_t count, NameOf name_of) {
         while (!fill(count, name_of))
@@ -33,8 +33,7 @@ private:
     constexpr std::size_t slot_of(std::string_view name) const {
         auto byte = [&](std::size_t at) { return std::uint64_t{static_cast<unsigned char>(name[at])}; };
         std::size_t size = name.size();
-        std::uint64_t key =
-            byte(0) | byte(size / 3) << 8 | byte(size / 2) << 16 | byte(size - 1) << 24 | std::uint64_t{size} << 32;
+        std::uint64_t key = byte(0) | byte((size - 1) / 2) << 8 | byte(size - 1) << 16 | std::uint64_t{size} << 24;
         return (key * multiplier) >> (64 - SLOT_BITS);
     }
 

@@ -9,8 +9,14 @@ namespace {
 
 constexpr size_t VARIABLE_IDS_AU = 64;
 
+/* A variable class and its list, which is made with its first ID. */
+struct class_and_list {
+    rsrc_variable_class_t *rvcp;
+    tbl *list;
+};
+
 /* Variable classes by name; of several with one name, the first. */
-using class_index = std::unordered_map<std::string_view, rsrc_variable_class_t *>;
+using class_index = std::unordered_map<std::string_view, class_and_list>;
 
 /* One without a name, which is one without strings, is found under none. */
 class_index index_by_name(cdgen &cx) {
@@ -18,18 +24,18 @@ class_index index_by_name(cdgen &cx) {
     for (rsrc_variable_class_t &variable_class : records_of<rsrc_variable_class_t>(&cx.rsrc_var_class_tbl)) {
         const tbl *strings = staged_tbl(variable_class.u_rvc_string_tbl);
         if (strings->tbl_base != nullptr)
-            index.emplace(strings->tbl_base + variable_class.u_rvc_name.offset[0], &variable_class);
+            index.try_emplace(strings->tbl_base + variable_class.u_rvc_name.offset[0],
+                              class_and_list{&variable_class, nullptr});
     }
     return index;
 }
 
 /* A name that is no variable class's is deliberately dropped in silence. */
-void add_varID_to_var_class(cdgen &cx, const class_index &index, const char *srch_name, var_id_t varID) {
+void add_varID_to_var_class(cdgen &cx, class_index &index, const char *srch_name, var_id_t varID) {
     auto found = index.find(srch_name);
     if (found == index.end())
         return;
-    rsrc_variable_class_t *rvcp = found->second;
-    tbl *list = find_tbl_entry(cx, rvcp);
+    auto &[rvcp, list] = found->second;
     if (list == nullptr) {
         list = make_tbl(cx, VARIABLE_IDS_AU, "VariableIDs");
         add_tbl_entry(cx, rvcp, list);
@@ -39,8 +45,7 @@ void add_varID_to_var_class(cdgen &cx, const class_index &index, const char *src
 }
 
 /* In a file no attribute refers to its variable class. */
-void take_ids(cdgen &cx, const class_index &index, const rsrc_class_t &rsrc_class, const cdb_ref_t &dattrs,
-              var_id_t mark) {
+void take_ids(cdgen &cx, class_index &index, const rsrc_class_t &rsrc_class, const cdb_ref_t &dattrs, var_id_t mark) {
     tbl *strings = staged_tbl(rsrc_class.u_rc_strings);
     for (rsrc_dattr_t &attr : records_of<rsrc_dattr_t>(staged_tbl(dattrs))) {
         vx_uint32_t name = attr.u_ra_vclass.offset[0];

@@ -4,28 +4,31 @@
 
 namespace {
 
-/* What a number of a type takes and what 100, the default upper bound, looks like in it. */
-struct number_format {
-    size_t width; /* bytes of the cell that are written; 0: no number */
-    bool integer;
-    vx_value_t hundred;
-};
-
-number_format number_format_of(vx_data_type_t type) {
+/* The bytes of the cell that a number of a type takes; 0 for no number. */
+size_t number_width(vx_data_type_t type) {
     switch (type) {
     case VX_INT32:
     case VX_UINT32:
-        return {4, true, {.val_int32 = 100}};
+    case VX_FLOAT32:
+        return 4;
     case VX_INT64:
     case VX_UINT64:
-        return {8, true, {.val_int64 = 100}};
-    case VX_FLOAT32:
-        return {4, false, {.val_float32 = 100.0F}};
     case VX_FLOAT64:
-        return {8, false, {.val_float64 = 100.0}};
+        return 8;
     default:
-        return {0, false, {}};
+        return 0;
     }
+}
+
+/* 100, the default upper bound, as a number of a type. */
+vx_value_t hundred(vx_data_type_t type) {
+    if (type == VX_FLOAT32)
+        return {.val_float32 = 100.0F};
+    if (type == VX_FLOAT64)
+        return {.val_float64 = 100.0};
+    if (number_width(type) == 8)
+        return {.val_int64 = 100};
+    return {.val_int32 = 100};
 }
 
 /* One value on its way into a cell. */
@@ -42,30 +45,38 @@ void store_offset(vx_value_t &cell, vx_uint32_t offset) {
     memcpy(&cell, &offset, sizeof offset);
 }
 
-/* The low 16 bits into the first two bytes. */
-void store_16(vx_value_t &cell, const encoding &e) {
-    auto narrow = static_cast<vx_uint16_t>(number_format_of(e.type).width == 4 ? e.in->val_uint32 : e.in->val_uint64);
+/* The low 16 bits into the first two bytes; integers outside arrays only. */
+int encode_16(vx_value_t &cell, const encoding &e) {
+    size_t width = number_width(e.type);
+    if (width == 0 || e.type == VX_FLOAT32 || e.type == VX_FLOAT64 || e.in_array)
+        return -1;
+    auto narrow = static_cast<vx_uint16_t>(width == 4 ? e.in->val_uint32 : e.in->val_uint64);
     memcpy(&cell, &narrow, sizeof narrow);
+    return 0;
+}
+
+void copy_number(vx_value_t &cell, const vx_value_t &number, size_t width) {
+    if (width == 4)
+        memcpy(&cell, &number, 4);
+    else if (width == 8)
+        memcpy(&cell, &number, 8);
 }
 
 int encode_number(vx_value_t &cell, const encoding &e) {
-    number_format format = number_format_of(e.type);
+    size_t width = number_width(e.type);
     vx_value_t zero = {};
     zero.val_uint64 = 0;
     switch (e.mode) {
     case TYPE_SAME:
-        memcpy(&cell, e.in, format.width);
+        copy_number(cell, *e.in, width);
         return 0;
     case TYPE_16:
-        if (!format.integer || e.in_array)
-            return -1;
-        store_16(cell, e);
-        return 0;
+        return encode_16(cell, e);
     case R_HI_DEFAULT:
-        memcpy(&cell, &format.hundred, format.width);
+        copy_number(cell, hundred(e.type), width);
         return 0;
     default:
-        memcpy(&cell, &zero, format.width);
+        copy_number(cell, zero, width);
         return 0;
     }
 }
@@ -210,6 +221,10 @@ vx_uint32_t init_array_sd(cdgen &cx, tbl *str_tbl, tbl_anchor *array_anchor, tbl
 
 int copy_this_type(cdgen &cx, vx_value_t *out_data, const vx_value_t *in_data, vx_data_type_t type_in, int type_out,
                    tbl *str_tbl, tbl_anchor *array_anchor, vx_uint32_t array_cnt) {
+    if (size_t width = number_width(type_in); width > 0 && type_out == TYPE_SAME && in_data != nullptr) {
+        copy_number(*out_data, *in_data, width); /* most values are plain numbers */
+        return 0;
+    }
     refuse(cx, type_in);
     if (type_in <= VX_UNKNOWN || type_in > VX_SD_PTR_ARRAY)
         return -1;

@@ -26,18 +26,40 @@ bool conversion_failed(const cdgen &cx) {
     return cx.conv_errno == ERANGE || cx.conv_errno == EINVAL;
 }
 
+/* More than 9 for what is no decimal digit. */
+unsigned digit_of(char c) {
+    return static_cast<unsigned>(c) - '0';
+}
+
 /* Plain decimal text of at most 18 digits, which is most of what is written: the C library's result, without it. Null
  * where its rules are wanted. */
 const char *plain_decimal(const char *text, vx_uint64_t *value) {
     constexpr int SAFE_DIGITS = 18;
     const char *p = text;
     vx_uint64_t n = 0;
-    for (; *p >= '0' && *p <= '9'; ++p)
-        n = n * 10 + static_cast<vx_uint64_t>(*p - '0');
+    for (unsigned digit = 0; (digit = digit_of(*p)) <= 9; ++p)
+        n = n * 10 + digit;
     if (p == text || p - text > SAFE_DIGITS)
         return nullptr;
     *value = n;
     return p;
+}
+
+/* Digits with or without a fraction, so few that they and the power of ten are exact: the one division rounds as the C
+ * library does. False where its rules are wanted. */
+template <class Float> bool plain_fraction(const char *text, Float *value) {
+    vx_uint64_t n = 0;
+    const char *p = plain_decimal(text, &n);
+    if (p == nullptr)
+        return false;
+    auto digits = p - text;
+    Float scale = 1;
+    if (*p == '.')
+        for (unsigned digit = 0; (digit = digit_of(*++p)) <= 9; ++digits, scale *= 10)
+            n = n * 10 + digit;
+    *value = static_cast<Float>(n) / scale;
+    bool rounded_once = FLT_EVAL_METHOD == 0 || FLT_EVAL_METHOD == 1;
+    return rounded_once && *p == '\0' && digits <= std::numeric_limits<Float>::digits10;
 }
 
 [[gnu::noinline]] long library_integer(cdgen &cx, const char *text, char **end, int base) {
@@ -61,6 +83,15 @@ bool whole_unsigned(cdgen &cx, const char *text, vx_uint64_t *value) {
         return *end == '\0';
     char *end = nullptr;
     *value = converted(cx, [&] { return strtoull(text, &end, 10); });
+    return *end == '\0';
+}
+
+template <class Float>
+bool whole_float(cdgen &cx, const char *text, Float *value, Float (*convert)(const char *, char **)) {
+    if (plain_fraction(text, value))
+        return true;
+    char *end = nullptr;
+    *value = converted(cx, [&] { return convert(text, &end); });
     return *end == '\0';
 }
 
@@ -116,18 +147,16 @@ int uint64_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) 
 }
 
 int float32_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
-    char *end = nullptr;
-    float value = converted(cx, [&] { return strtof(text, &end); });
-    if (*end != '\0' || (suspicious_float(value) && conversion_failed(cx)))
+    float value = 0;
+    if (!whole_float(cx, text, &value, strtof) || (suspicious_float(value) && conversion_failed(cx)))
         return -1;
     out->val_float32 = value;
     return 0;
 }
 
 int float64_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
-    char *end = nullptr;
-    double value = converted(cx, [&] { return strtod(text, &end); });
-    if (*end != '\0' || (suspicious_float(value) && conversion_failed(cx)))
+    double value = 0;
+    if (!whole_float(cx, text, &value, strtod) || (suspicious_float(value) && conversion_failed(cx)))
         return -1;
     out->val_float64 = value;
     return 0;

@@ -35,8 +35,14 @@ struct tbl {
     tbl &operator=(const tbl &) = delete;
     ~tbl();
 
+    /* Empty, as if it were new; the block waits for the first reservation. */
+    void restart(const char *name);
+
     size_t used() const {
         return static_cast<size_t>(tbl_next - tbl_base);
+    }
+    size_t room() const {
+        return static_cast<size_t>(tbl_end - tbl_next);
     }
 
     char *tbl_base = nullptr;      /* null until the first reservation */
@@ -47,6 +53,7 @@ struct tbl {
     size_t tbl_au;                 /* bytes: the first block and the granule of every growth */
     const char *tbl_name;          /* for traces and messages */
     size_t tbl_capacity = 0;       /* bytes really held, at least tbl_size */
+    char *tbl_spare = nullptr;     /* the block before the first reservation, if there is one already */
 };
 
 /* Where the container that is being filled stands in a string table; nothing until the first element is added. */
@@ -326,6 +333,12 @@ sd_type_t SD_stanza_type(int table_id);
 struct dflt_values {
     dflt_values(const char *name) : cells(32, name) {}
 
+    /* Empty, as if it were new, but for memory that serves again. */
+    void restart(const char *name) {
+        cells.restart(name);
+        texts.clear();
+    }
+
     struct tbl cells;
     text_pool texts; /* what the cells point at */
 };
@@ -436,7 +449,8 @@ struct cdgen {
     const srtable_ctrl *prev_scp = nullptr;
     const srtable_ctrl *curr_sd_scp = nullptr; /* of the latest header */
     std::array<stanza_state, SC_COUNT> stanzas;
-    stanza_state *state = nullptr; /* that of scp */
+    stanza_state *state = nullptr;           /* that of scp */
+    std::shared_ptr<dflt_values> spare_dflt; /* one that no stanza holds any more, for the next */
 
     /* Staging records */
     rsrc_class_t cb_rsrc_class = {};

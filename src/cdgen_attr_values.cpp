@@ -218,6 +218,13 @@ bool is_sd(vx_data_type_t type) {
     return scalar_vx(type) == VX_SD_PTR;
 }
 
+std::shared_ptr<dflt_values> new_dflt_values(cdgen &cx, const char *name) {
+    if (cx.spare_dflt == nullptr)
+        return std::make_shared<dflt_values>(name);
+    cx.spare_dflt->restart(name);
+    return std::move(cx.spare_dflt);
+}
+
 /* Collects the value; the attribute's completion makes one of all that were given. */
 void store_default(const attr_line &line) {
     cdgen &cx = line.cx;
@@ -226,7 +233,7 @@ void store_default(const attr_line &line) {
         source_error(cx, "Default values not expected; place default values in individual *SDDef stanzas.");
     dflt_tbl &dflt = line.state.dflt;
     if (dflt.tbl == nullptr)
-        dflt.tbl = std::make_shared<dflt_values>("DefaultValues");
+        dflt.tbl = new_dflt_values(cx, "DefaultValues");
     void *slot = alloc_tble(cx, &dflt.tbl->cells, sizeof(vx_value_t));
     vx_value_t value = {};
     if (str_to_vx(cx, &value, type, line.value, dflt.tbl->texts) != 0)
@@ -243,7 +250,7 @@ void expect_sd_run(const attr_line &line, vx_data_type_t type) {
     cx.curr_sd_tbl = reinterpret_cast<cdb_ref_t *>(line.record + kind.sd_offset);
     cx.max_sd_idx = reinterpret_cast<vx_uint16_t *>(line.record + kind.max_sd_idx_offset);
     cx.sd_attr_type = kind.sd_attr_type;
-    line.state.dflt.tbl = std::make_shared<dflt_values>(type == VX_SD_PTR ? "VX_SD_PTR" : "VX_SD_PTR_ARRAY");
+    line.state.dflt.tbl = new_dflt_values(cx, type == VX_SD_PTR ? "VX_SD_PTR" : "VX_SD_PTR_ARRAY");
 }
 
 void store_data_type(const attr_line &line) {

@@ -161,6 +161,13 @@ stanza_state &state_of(cdgen &cx, const srtable_ctrl *scp) {
     return cx.stanzas[static_cast<size_t>(scp - sc_tables.data())];
 }
 
+/* The values of the stanza before have been used. */
+void forget_values(cdgen &cx, dflt_tbl &dflt) {
+    if (dflt.tbl.use_count() == 1)
+        cx.spare_dflt = std::move(dflt.tbl);
+    dflt = {};
+}
+
 void begin_sd_stanza(cdgen &cx) {
     bool of_attribute = is_attr_SD(cx.table_id) != nullptr;
     stanza_state &state = state_of(cx, cx.scp);
@@ -180,7 +187,7 @@ void begin_sd_stanza(cdgen &cx) {
     if (cx.cb_sd_def.sd_cb_ID == 0) {
         begin_sd_run(cx, of_attribute);
         if (!of_attribute)
-            state.dflt = {};
+            forget_values(cx, state.dflt);
     }
     cx.scp->sc_init_tbl(cx);
     state.req_mask = state.opt_mask = 0;
@@ -195,7 +202,8 @@ void begin_plain_stanza(cdgen &cx) {
     if (cx.cb_rsrc_actionC.ac_cb_ID != 0)
         cmplt_actionC_tbl(cx);
     cx.scp->sc_init_tbl(cx);
-    state_of(cx, cx.scp) = {};
+    forget_values(cx, cx.state->dflt);
+    cx.state->req_mask = cx.state->opt_mask = 0;
     cx.attr_dflt_val = nullptr;
     cx.curr_sd_tbl = nullptr;
     cx.max_sd_idx = nullptr;

@@ -11,6 +11,15 @@
 
 tbl::~tbl() {
     free(tbl_base);
+    free(tbl_spare);
+}
+
+void tbl::restart(const char *name) {
+    if (tbl_base != nullptr)
+        tbl_spare = tbl_base;
+    tbl_base = tbl_prev_base = tbl_next = tbl_end = nullptr;
+    tbl_size = 0;
+    tbl_name = name;
 }
 
 void *cfg_malloc(cdgen &cx, size_t s) {
@@ -55,7 +64,7 @@ char *larger_block(tbl &t, size_t needed) {
 }
 
 void first_block(cdgen &cx, tbl &t) {
-    char *block = larger_block(t, t.tbl_au);
+    char *block = t.tbl_spare != nullptr ? std::exchange(t.tbl_spare, nullptr) : larger_block(t, t.tbl_au);
     if (block == nullptr)
         table_failure(cx, t, ": alloc_tble malloc failure: ");
     memset(block, 0, t.tbl_au);
@@ -88,15 +97,20 @@ void grow(cdgen &cx, tbl &t, size_t s) {
         printf("alloc_tble: %s, new table size: %d\n", t.tbl_name, static_cast<int>(t.tbl_size));
 }
 
+[[gnu::noinline]] void make_room(cdgen &cx, tbl &t, size_t s) {
+    if (cx.debugLevel > 2)
+        printf("alloc_tble: %s, structure size: %d\n", t.tbl_name, static_cast<int>(s));
+    if (t.tbl_base == nullptr)
+        first_block(cx, t);
+    if (s >= t.room())
+        grow(cx, t, s);
+}
+
 } // namespace
 
 void *alloc_tble(cdgen &cx, tbl *t, size_t s) {
-    if (cx.debugLevel > 2)
-        printf("alloc_tble: %s, structure size: %d\n", t->tbl_name, static_cast<int>(s));
-    if (t->tbl_base == nullptr)
-        first_block(cx, *t);
-    if (s >= static_cast<size_t>(t->tbl_end - t->tbl_next)) /* reaching the end exactly grows too */
-        grow(cx, *t, s);
+    if (s >= t->room() || cx.debugLevel > 2) /* reaching the end exactly grows too; without a block there is no room */
+        make_room(cx, *t, s);
     char *reserved = t->tbl_next;
     t->tbl_next += s;
     return reserved;

@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <span>
+#include <utility>
 
 namespace {
 
@@ -34,6 +35,10 @@ template <class Number> Number load(const char *from) {
     return number;
 }
 
+template <class Number> void store(char *to, Number number) {
+    memcpy(to, &number, sizeof number);
+}
+
 vx_uint32_t load_word(const char *from) {
     return load<vx_uint32_t>(from);
 }
@@ -50,27 +55,39 @@ bool is_array(vx_data_type_t type) {
     return known_type(type) && (cu_dtc_table_1[type] & IS_ARRAY) != 0;
 }
 
+/* The tables are known while compiling: taken apart field by field, there remains only what is to be done. */
+template <const auto &fields> constexpr auto rows = std::make_index_sequence<std::size(fields)>();
+
 /* Numbers whole, references in their first word; values are turned elsewhere, because their type must be known. */
-void swap_fields(char *record, std::span<const field> fields) {
-    for (const field &f : fields) {
-        if (f.stays)
-            continue;
-        bool reference = f.kind == field_kind::reference;
-        if (!reference && f.kind != field_kind::number)
-            continue;
-        char *at = record + f.offset;
-        for (size_t i = 0; i < f.count; ++i, at += f.width)
-            swap_any(at, reference ? sizeof(vx_uint32_t) : f.width);
-    }
+[[gnu::always_inline]] inline void swap_field(char *record, const field &f) {
+    bool reference = f.kind == field_kind::reference;
+    if (f.stays || (!reference && f.kind != field_kind::number))
+        return;
+    char *at = record + f.offset;
+    for (size_t i = 0; i < f.count; ++i, at += f.width)
+        swap_any(at, reference ? sizeof(vx_uint32_t) : f.width);
 }
 
-void swap_values(char *record, std::span<const field> fields, vx_data_type_t owner_type, swap_area &sbase_p) {
-    for (const field &f : fields) {
-        if (f.kind != field_kind::value)
-            continue;
-        bool own = f.type_at != cdb::TYPE_OF_OWNER;
-        swap_value(record + f.offset, own ? load<vx_data_type_t>(record + f.type_at) : owner_type, sbase_p);
+template <const auto &fields> void swap_fields(char *record) {
+    [&]<size_t... row>(std::index_sequence<row...>) {
+        (swap_field(record, fields[row]), ...);
     }
+    (rows<fields>);
+}
+
+[[gnu::always_inline]] inline void swap_value_of(char *record, const field &f, vx_data_type_t owner_type,
+                                                 swap_area &sbase_p) {
+    if (f.kind != field_kind::value)
+        return;
+    bool own = f.type_at != cdb::TYPE_OF_OWNER;
+    swap_value(record + f.offset, own ? load<vx_data_type_t>(record + f.type_at) : owner_type, sbase_p);
+}
+
+template <const auto &fields> void swap_values(char *record, vx_data_type_t owner_type, swap_area &sbase_p) {
+    [&]<size_t... row>(std::index_sequence<row...>) {
+        (swap_value_of(record, fields[row], owner_type, sbase_p), ...);
+    }
+    (rows<fields>);
 }
 
 /* ---- Out-of-line values ---------------------------------------------------------------------------------------- */
@@ -88,10 +105,10 @@ void swap_structured_data(vx_uint32_t offset, swap_area &sbase_p) {
         return;
     char *element = sd + HEAD;
     for (vx_uint32_t n = load_word(sd); n > 0; --n, element += SIZE) {
-        swap_values(element, cdb::structured_data_element_fields, VX_UNKNOWN, sbase_p);
-        swap_fields(element, cdb::structured_data_element_fields);
+        swap_values<cdb::structured_data_element_fields>(element, VX_UNKNOWN, sbase_p);
+        swap_fields<cdb::structured_data_element_fields>(element);
     }
-    swap_fields(sd, cdb::structured_data_fields);
+    swap_fields<cdb::structured_data_fields>(sd);
 }
 
 void swap_array(vx_uint32_t offset, vx_data_type_t element_type, swap_area &sbase_p) {
@@ -102,7 +119,7 @@ void swap_array(vx_uint32_t offset, vx_data_type_t element_type, swap_area &sbas
     char *element = array + HEAD;
     for (vx_uint32_t n = load_word(array); n > 0; --n, element += sizeof(vx_value_t))
         swap_value(element, element_type, sbase_p);
-    swap_fields(array, cdb::array_fields);
+    swap_fields<cdb::array_fields>(array);
 }
 
 void swap_out_of_line(vx_uint32_t offset, vx_data_type_t type, swap_area &sbase_p) {
@@ -148,31 +165,37 @@ void follow_sd_def(vx_uint32_t offset, const swap_areas &areas) {
 }
 
 /* What a record refers to in the class's list tables. type: that of the record's values. */
-void follow_references(const char *record, std::span<const field> fields, vx_data_type_t type,
-                       const swap_areas &areas) {
-    for (const field &f : fields) {
-        if (f.kind != field_kind::reference)
-            continue;
-        vx_uint32_t offset = load_word(record + f.offset);
-        if (offset == CDB_NONE)
-            continue;
-        if (f.to == target::variety_lists)
-            follow_variety_list(offset, areas.vlbase_p);
-        else if (f.to == target::valid_vals)
-            follow_valid_vals(offset, type, areas.vvbase_p, areas.sbase_p);
-        else if (f.to == target::sd_defs)
-            follow_sd_def(offset, areas);
+[[gnu::always_inline]] inline void follow_reference(const char *record, const field &f, vx_data_type_t type,
+                                                    const swap_areas &areas) {
+    bool to_list = f.to == target::variety_lists || f.to == target::valid_vals || f.to == target::sd_defs;
+    if (f.kind != field_kind::reference || !to_list)
+        return;
+    vx_uint32_t offset = load_word(record + f.offset);
+    if (offset == CDB_NONE)
+        return;
+    if (f.to == target::variety_lists)
+        follow_variety_list(offset, areas.vlbase_p);
+    else if (f.to == target::valid_vals)
+        follow_valid_vals(offset, type, areas.vvbase_p, areas.sbase_p);
+    else
+        follow_sd_def(offset, areas);
+}
+
+template <const auto &fields> void follow_references(const char *record, vx_data_type_t type, const swap_areas &areas) {
+    [&]<size_t... row>(std::index_sequence<row...>) {
+        (follow_reference(record, fields[row], type, areas), ...);
     }
+    (rows<fields>);
 }
 
 /* type_at: where the record holds the type of its values, or TYPE_OF_OWNER if it has none. */
-void swap_records(char *first, vx_uint32_t count, size_t size, std::span<const field> fields, std::uint16_t type_at,
-                  const swap_areas &areas) {
+template <const auto &fields>
+void swap_records(char *first, vx_uint32_t count, size_t size, std::uint16_t type_at, const swap_areas &areas) {
     for (char *record = first; count > 0; --count, record += size) {
         auto type = type_at == cdb::TYPE_OF_OWNER ? VX_UNKNOWN : load<vx_data_type_t>(record + type_at);
-        follow_references(record, fields, type, areas);
-        swap_values(record, fields, type, areas.sbase_p);
-        swap_fields(record, fields);
+        follow_references<fields>(record, type, areas);
+        swap_values<fields>(record, type, areas.sbase_p);
+        swap_fields<fields>(record);
     }
 }
 
@@ -245,19 +268,19 @@ void swap_class(const swap_section &section) {
     swap_area sd_defs = section.area(rc.u_rc_sd_defs, rc.rc_sd_size);
     swap_areas areas = {strings, valid_vals, variety_lists, sd_defs};
     swap_class_tables(section, rc, attribute_tables, areas);
-    follow_references(section.start, cdb::class_fields, VX_UNKNOWN, areas); /* the five SD inputs */
+    follow_references<cdb::class_fields>(section.start, VX_UNKNOWN, areas); /* the five SD inputs */
     swap_class_tables(section, rc, other_tables, areas);
-    swap_fields(section.start, cdb::class_fields);
+    swap_fields<cdb::class_fields>(section.start);
 }
 
 void swap_mgr(const swap_section &section) {
     if (section.holds(0, sizeof(rsrc_mgr_t)))
-        swap_fields(section.start, cdb::mgr_fields);
+        swap_fields<cdb::mgr_fields>(section.start);
 }
 
 void swap_cmmap(const swap_section &section) {
     if (section.holds(0, sizeof(rsrc_cmmap_t)))
-        swap_fields(section.start, cdb::cmmap_fields);
+        swap_fields<cdb::cmmap_fields>(section.start);
 }
 
 void swap_var_class(const swap_section &section) {
@@ -267,7 +290,7 @@ void swap_var_class(const swap_section &section) {
     size_t ids = sizeof rvc + rvc.u_rvc_string_tbl.offset[0];
     for (vx_uint32_t n = section.records_inside(ids, rvc.rvc_var_count, sizeof(var_id_t)); n > 0; --n)
         swap_word(section.start + ids + (n - 1) * sizeof(var_id_t));
-    swap_fields(section.start, cdb::variable_class_fields);
+    swap_fields<cdb::variable_class_fields>(section.start);
 }
 
 void swap_class_hash(const swap_section &section) {
@@ -277,8 +300,8 @@ void swap_class_hash(const swap_section &section) {
         return;
     vx_uint32_t count = load_word(section.start + offsetof(rsrc_class_hash_t, rch_num_hash_blocks));
     for (vx_uint32_t n = section.records_inside(BLOCKS, count, SIZE); n > 0; --n)
-        swap_fields(section.start + BLOCKS + (n - 1) * SIZE, cdb::rc_hash_block_fields);
-    swap_fields(section.start, cdb::class_hash_fields);
+        swap_fields<cdb::rc_hash_block_fields>(section.start + BLOCKS + (n - 1) * SIZE);
+    swap_fields<cdb::class_hash_fields>(section.start);
 }
 
 void swap_section_of(const cdb_dsect_anchor_t &anchor, const swap_section &section) {
@@ -319,8 +342,12 @@ char *swap_area::take(vx_uint32_t offset, size_t head, size_t count_at, size_t e
 }
 
 void swap_any(char *field, size_t width) {
-    if (width == 2 || width == 4 || width == 8)
-        std::reverse(field, field + width);
+    if (width == 2)
+        store(field, __builtin_bswap16(load<vx_uint16_t>(field)));
+    else if (width == 4)
+        store(field, __builtin_bswap32(load<vx_uint32_t>(field)));
+    else if (width == 8)
+        store(field, __builtin_bswap64(load<vx_uint64_t>(field)));
 }
 
 void swap_value(char *value, vx_data_type_t type, swap_area &sbase_p) {
@@ -348,18 +375,18 @@ void swap_value(char *value, vx_data_type_t type, swap_area &sbase_p) {
 void swap_var_list(char *list) {
     char *entry = list + offsetof(variety_list_t, vl_values);
     for (auto n = load_word(list + offsetof(variety_list_t, vl_count)); n > 0; --n, entry += sizeof(vl_entry_t))
-        swap_fields(entry, cdb::vl_entry_fields);
-    swap_fields(list, cdb::variety_list_fields);
+        swap_fields<cdb::vl_entry_fields>(entry);
+    swap_fields<cdb::variety_list_fields>(list);
 }
 
 void swap_valid_vals(char *vv, vx_data_type_t type, swap_area &sbase_p) {
     vx_data_type_t value_type = is_array(type) ? cu_dtc_base_types_1[type] : type;
     char *entry = vv + offsetof(valid_values_t, vv_values);
     for (auto n = load_word(vv + offsetof(valid_values_t, vv_count)); n > 0; --n, entry += sizeof(vv_entry_t)) {
-        swap_values(entry, cdb::vv_entry_fields, value_type, sbase_p);
-        swap_fields(entry, cdb::vv_entry_fields);
+        swap_values<cdb::vv_entry_fields>(entry, value_type, sbase_p);
+        swap_fields<cdb::vv_entry_fields>(entry);
     }
-    swap_fields(vv, cdb::valid_values_fields);
+    swap_fields<cdb::valid_values_fields>(vv);
 }
 
 void swap_sd_def(char *sd, swap_area &vvbase_p, swap_area &sbase_p) {
@@ -368,39 +395,39 @@ void swap_sd_def(char *sd, swap_area &vvbase_p, swap_area &sbase_p) {
         auto field = load<sd_field_t>(element);
         if (field.u_sd_valid_vals.offset[0] != CDB_NONE)
             follow_valid_vals(field.u_sd_valid_vals.offset[0], field.sd_field_type, vvbase_p, sbase_p);
-        swap_fields(element, cdb::sd_field_fields);
+        swap_fields<cdb::sd_field_fields>(element);
     }
-    swap_fields(sd, cdb::sd_def_fields);
+    swap_fields<cdb::sd_def_fields>(sd);
 }
 
 void swap_pattr(char *first, vx_uint32_t count, swap_area &sbase_p, swap_area &vvbase_p, swap_area &vlbase_p,
                 swap_area &sdbase_p) {
-    swap_records(first, count, sizeof(rsrc_pattr_t), cdb::pattr_fields, offsetof(rsrc_pattr_t, ra_data_type),
-                 {sbase_p, vvbase_p, vlbase_p, sdbase_p});
+    swap_records<cdb::pattr_fields>(first, count, sizeof(rsrc_pattr_t), offsetof(rsrc_pattr_t, ra_data_type),
+                                    {sbase_p, vvbase_p, vlbase_p, sdbase_p});
 }
 
 void swap_dattr(char *first, vx_uint32_t count, swap_area &sbase_p, swap_area &vvbase_p, swap_area &vlbase_p,
                 swap_area &sdbase_p) {
-    swap_records(first, count, sizeof(rsrc_dattr_t), cdb::dattr_fields, offsetof(rsrc_dattr_t, ra_data_type),
-                 {sbase_p, vvbase_p, vlbase_p, sdbase_p});
+    swap_records<cdb::dattr_fields>(first, count, sizeof(rsrc_dattr_t), offsetof(rsrc_dattr_t, ra_data_type),
+                                    {sbase_p, vvbase_p, vlbase_p, sdbase_p});
 }
 
 void swap_action(char *first, vx_uint32_t count, swap_area &sbase_p, swap_area &vvbase_p, swap_area &vlbase_p,
                  swap_area &sdbase_p) {
-    swap_records(first, count, sizeof(rsrc_action_t), cdb::action_fields, cdb::TYPE_OF_OWNER,
-                 {sbase_p, vvbase_p, vlbase_p, sdbase_p});
+    swap_records<cdb::action_fields>(first, count, sizeof(rsrc_action_t), cdb::TYPE_OF_OWNER,
+                                     {sbase_p, vvbase_p, vlbase_p, sdbase_p});
 }
 
 void swap_errors(char *first, vx_uint32_t count, swap_area &sbase_p, swap_area &vvbase_p, swap_area &vlbase_p,
                  swap_area &sdbase_p) {
-    swap_records(first, count, sizeof(rsrc_error_t), cdb::error_fields, cdb::TYPE_OF_OWNER,
-                 {sbase_p, vvbase_p, vlbase_p, sdbase_p});
+    swap_records<cdb::error_fields>(first, count, sizeof(rsrc_error_t), cdb::TYPE_OF_OWNER,
+                                    {sbase_p, vvbase_p, vlbase_p, sdbase_p});
 }
 
 void swap_depends(char *first, vx_uint32_t count, swap_area &sbase_p, swap_area &vvbase_p, swap_area &vlbase_p,
                   swap_area &sdbase_p) {
-    swap_records(first, count, sizeof(rsrc_depend_t), cdb::depend_fields, cdb::TYPE_OF_OWNER,
-                 {sbase_p, vvbase_p, vlbase_p, sdbase_p});
+    swap_records<cdb::depend_fields>(first, count, sizeof(rsrc_depend_t), cdb::TYPE_OF_OWNER,
+                                     {sbase_p, vvbase_p, vlbase_p, sdbase_p});
 }
 
 void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere) {
@@ -414,10 +441,10 @@ void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere) {
         auto anchor = load<cdb_dsect_anchor_t>(anchor_p);
         if (file.holds(anchor.cda_offset, anchor.cda_length))
             swap_section_of(anchor, {cdb_hdr_p + anchor.cda_offset, anchor.cda_length});
-        swap_fields(anchor_p, cdb::cdb_dsect_anchor_fields);
+        swap_fields<cdb::cdb_dsect_anchor_fields>(anchor_p);
     }
     set_words(cdb_hdr_p, nowhere, 0);
-    swap_fields(cdb_hdr_p, cdb::cdb_header_fields);
+    swap_fields<cdb::cdb_header_fields>(cdb_hdr_p);
     vx_uint32_t checksum = cdb_checksum(cdb_hdr_p, load_word(cdb_hdr_p), header.cdb_hdr_length);
     memcpy(cdb_hdr_p + offsetof(orb_cdb_header_t, cdb_hdr_checksum), &checksum, sizeof checksum);
 }

@@ -63,6 +63,13 @@ void complete_open_records(cdgen &cx) {
         cmplt_sd_tbl(cx, cx.curr_sd_scp);
 }
 
+/* The collected defaults, which have all been serialised; the image needs the memory. */
+void drop_values(cdgen &cx) {
+    for (stanza_state &state : cx.stanzas)
+        state.dflt = {};
+    cx.spare_dflt = nullptr;
+}
+
 /* The ID of the last class's persistent resource attribute with the locator's name; an unknown name is no error. */
 vx_uint16_t locator_id(cdgen &cx) {
     tbl *strings = sc_tables[SC_PERSISTENT_RESOURCE_ATTRIBUTE].sc_str_tbl(cx);
@@ -148,6 +155,7 @@ void compile(cdgen &cx) {
     complete_open_records(cx);
     resolve_locator(cx);
     complete_top_level(cx);
+    drop_values(cx);
     bld_var_id_tbls(cx);
     bld_cdb(cx);
 }

@@ -72,6 +72,10 @@ tbl *make_tbl(cdgen &cx, size_t au, const char *name);
 /* Reserves s bytes, zeroed, at the end of t. The address holds until the next reservation in t. */
 void *alloc_tble(cdgen &cx, tbl *t, size_t s);
 
+/* Gives back what a table does not use, down to tbl_next, once nothing more is to come: with many classes the rest of
+ * their blocks would be most of the memory. */
+void trim_tbl(tbl *t);
+
 /* Appends len bytes, zero-filled up to a multiple of 8; returns their offset from tbl_base. add_to_tbl is the name that
  * serves for strings and serialised values. */
 vx_uint32_t save_tbl_val_round(cdgen &cx, tbl *tp, const void *val, size_t len);

@@ -116,6 +116,18 @@ void *alloc_tble(cdgen &cx, tbl *t, size_t s) {
     return reserved;
 }
 
+void trim_tbl(tbl *t) {
+    size_t used = t == nullptr ? 0 : t->used();
+    if (used == 0)
+        return;
+    char *block = static_cast<char *>(realloc(t->tbl_base, used));
+    if (block == nullptr)
+        return;
+    t->tbl_base = block;
+    t->tbl_next = t->tbl_end = block + used;
+    t->tbl_size = t->tbl_capacity = used;
+}
+
 vx_uint32_t save_tbl_val_round(cdgen &cx, tbl *tp, const void *val, size_t len) {
     auto *copy = static_cast<char *>(alloc_tble(cx, tp, round8(len)));
     memcpy(copy, val, len);
@@ -139,7 +151,8 @@ void *tbl_at(cdgen &cx, tbl *t, size_t offset, size_t size) {
     return t->tbl_base + offset;
 }
 
-/* A pool grows by chunks that hold several lines' values; the first one serves again after clear(). */
+/* A pool grows by chunks that hold several lines' values, each twice as large as the one before; the latest serves
+ * again after clear(). */
 struct text_pool::chunk {
     chunk *next;
     size_t size; /* bytes that follow */
@@ -161,7 +174,7 @@ text_pool::~text_pool() {
 char *text_pool::take(size_t n) {
     n = round8(n);
     if (head == nullptr || n > left) {
-        size_t size = std::max(n, POOL_CHUNK);
+        size_t size = std::max(n, head == nullptr ? POOL_CHUNK : 2 * head->size);
         auto *fresh = static_cast<chunk *>(malloc(sizeof(chunk) + size));
         if (fresh == nullptr)
             return nullptr;

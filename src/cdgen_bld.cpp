@@ -107,8 +107,8 @@ size_t prefill(cdgen &cx, int fd, size_t size) {
     constexpr size_t BLOCKS_AT_ONCE = 512;
     static std::array<char, PREFILL_BLOCK> zeros;
     std::array<iovec, BLOCKS_AT_ONCE> blocks;
-    blocks.fill({zeros.data(), zeros.size()});
     size_t gross = (size + PREFILL_BLOCK - 1) / PREFILL_BLOCK * PREFILL_BLOCK;
+    std::fill_n(blocks.begin(), std::min(blocks.size(), gross / PREFILL_BLOCK), iovec{zeros.data(), zeros.size()});
     for (size_t written = 0; written < gross;) {
         size_t left = gross - written;
         blocks[0].iov_len = (left - 1) % PREFILL_BLOCK + 1; /* what a short write has left of its block */

@@ -403,12 +403,11 @@ struct _rc_locator_t {
     char name[LOCATOR_SIZE] = {};
 };
 
-/* An attribute that a new class found open, and which so refers to a valid-value list that it does not have: the last
- * record of one of the class's tables. */
-struct listless_record {
+/* A word of an attribute's record that looks like a reference and is none. */
+struct stray_reference {
     int rsrc_class; /* the class's position among all */
     cdb_ref_t rsrc_class_t::*records;
-    size_t from_end; /* bytes from the reference to the end of the table */
+    size_t offset; /* in that table of the class, bytes */
 };
 
 /* A variable class and the list of its variable IDs. */
@@ -489,7 +488,8 @@ struct cdgen {
     vx_uint16_t dattr_vv_found = 0;
     vx_uint16_t dattrC_vv_found = 0;
     vx_uint16_t dattr_range_found = 0; /* deliberately one flag for both dynamic kinds, cleared at a completion only */
-    text_pool line_texts;              /* out-of-line values of the current line */
+    vx_data_type_t dattr_range_type = VX_UNKNOWN; /* of the range in the open resource attribute, if it has one */
+    text_pool line_texts;                         /* out-of-line values of the current line */
 
     /* Structured data */
     vx_value_t *attr_dflt_val = nullptr; /* while the current attribute is of an SD type: its value */
@@ -505,10 +505,10 @@ struct cdgen {
     int sd_dt_found = 0;
     int sd_vv_found = 0;
 
-    /* What the reversal cannot see in the image: references that look like one to the first list, and are none. */
-    std::vector<listless_record> listless; /* by class */
-    size_t listless_done = 0;              /* those whose class has been written */
-    std::vector<size_t> nowhere;           /* their places in the image, in bytes */
+    /* What the reversal cannot see in the image. */
+    std::vector<stray_reference> strays; /* by class */
+    size_t strays_done = 0;              /* those whose class has been written */
+    std::vector<size_t> nowhere;         /* their places in the image, in bytes */
 
     /* Variable IDs */
     std::array<tbl_pair, TBL_ENTRIES_MAX> tbl_entries = {};
@@ -600,8 +600,8 @@ void add_rsrc_var_class_tbls(cdgen &cx);
 /* Unmaps, closes and removes the output file if it is mapped. */
 void discard_mapfile(cdgen &cx);
 
-/* Reverses the byte order of a finished image in place. nowhere: places in the image of references that are 0 and lead
- * nowhere; they are not followed. */
+/* Reverses the byte order of a finished image in place. nowhere: places in the image of words that look like references
+ * and are none; they are reversed, but not followed. */
 void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere = {});
 
 /* A descriptor above the three standard ones, so that a trace on a closed stream cannot end up in it; or -1. */

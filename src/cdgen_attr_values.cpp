@@ -279,7 +279,10 @@ void store_range(const attr_line &line) {
     char *max = after_comma(line);
     if (max == nullptr)
         source_error(cx, "Range requires two values");
-    rsrc_dattr_t &target = cx.cb_rsrc_dattr.ra_cb_ID != 0 ? cx.cb_rsrc_dattr : cx.cb_rsrc_dattrC;
+    bool of_resource = cx.cb_rsrc_dattr.ra_cb_ID != 0;
+    rsrc_dattr_t &target = of_resource ? cx.cb_rsrc_dattr : cx.cb_rsrc_dattrC;
+    if (of_resource)
+        cx.dattr_range_type = type;
     copied(line, &target.ra_max_value, converted(line, type, max), type, COPY_ERROR);
     copied(line, &target.ra_min_value, converted(line, type, line.value), type, DATA_ERROR);
 }

@@ -235,13 +235,12 @@ constexpr class_side_table class_side_tables[] = {
 };
 
 /* The places of references that are none, once the class's tables have theirs. Classes are the first sections. */
-void note_nowhere(cdgen &cx, const rsrc_class_t &staged, const rsrc_class_t &record, const char *at) {
-    for (; cx.listless_done < cx.listless.size(); ++cx.listless_done) {
-        const listless_record &listless = cx.listless[cx.listless_done];
-        if (listless.rsrc_class != cx.dsect_idx)
+void note_nowhere(cdgen &cx, const rsrc_class_t &record, const char *at) {
+    for (; cx.strays_done < cx.strays.size(); ++cx.strays_done) {
+        const stray_reference &stray = cx.strays[cx.strays_done];
+        if (stray.rsrc_class != cx.dsect_idx)
             break;
-        cx.nowhere.push_back(static_cast<size_t>(at - cx.chp) + (record.*listless.records).offset[0] +
-                             used_bytes(staged.*listless.records) - listless.from_end);
+        cx.nowhere.push_back(static_cast<size_t>(at - cx.chp) + (record.*stray.records).offset[0] + stray.offset);
     }
 }
 
@@ -258,7 +257,7 @@ void add_class(cdgen &cx, const rsrc_class_t &staged) {
             out.write_table(staged.*field);
     }
     store(at, record);
-    note_nowhere(cx, staged, record, at);
+    note_nowhere(cx, record, at);
     out.finish();
 }
 

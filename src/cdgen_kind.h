@@ -47,6 +47,10 @@ template <class Attribute> void settle_group(Attribute &attr, const stanza_state
         attr.ra_group_msgid = 0;
 }
 
+/* A dynamic resource attribute, about to be filed, may have the range of a class attribute of another type: a number
+ * where it would refer to a value. */
+void note_stray_range(cdgen &cx, const rsrc_dattr_t &attr, cdb_ref_t rsrc_class_t::*records);
+
 inline bool has_values(const dflt_tbl &dflt) {
     return dflt.tbl != nullptr && dflt.num_elems > 0;
 }

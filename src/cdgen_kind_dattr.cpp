@@ -57,6 +57,7 @@ void settle_range(cdgen &cx, rsrc_dattr_t &attr) {
         mark_absent(attr.ra_min_value);
         mark_absent(attr.ra_max_value);
     } else if (!cx.dattr_range_found) {
+        cx.dattr_range_type = VX_UNKNOWN;
         default_bound(cx, &attr.ra_min_value, attr.ra_data_type, R_LO_DEFAULT,
                       "copy_this_type default min range error (dattr)");
         default_bound(cx, &attr.ra_max_value, attr.ra_data_type, R_HI_DEFAULT,
@@ -88,6 +89,8 @@ void open_dattr(cdgen &cx, const dattr_kind &kind) {
     mark_absent(attr.u_ra_rearm_expr);
     attr.ra_max_sd_idx = NO_SD_IDX;
     mark_absent(attr.u_ra_sd);
+    if (kind.id == resource_kind.id)
+        cx.dattr_range_type = VX_UNKNOWN;
     cx.vvdisp.reset();
     valid_vals_found(cx, kind) = 0;
 }
@@ -109,6 +112,7 @@ void complete_dattr(cdgen &cx, const dattr_kind &kind) {
     settle_range(cx, attr);
     settle_initial_value(cx, kind, attr);
     settle_group(attr, cx.stanzas[kind.id]);
+    note_stray_range(cx, attr, kind.records);
     append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), attr);
     attr.ra_cb_ID = 0;
 }
@@ -120,7 +124,22 @@ void start_dattr(cdgen &cx, const dattr_kind &kind) {
     open_dattr(cx, kind);
 }
 
+bool is_array_of_numbers(vx_data_type_t type) {
+    return is_vx_array(type) && scalar_vx(type) <= VX_FLOAT64;
+}
+
 } // namespace
+
+void note_stray_range(cdgen &cx, const rsrc_dattr_t &attr, cdb_ref_t rsrc_class_t::*records) {
+    vx_data_type_t type = attr.ra_data_type;
+    bool refers = has_no_range(type) || is_vx_array(type);
+    bool sound = is_array_of_numbers(type) && is_array_of_numbers(cx.dattr_range_type);
+    if (attr.ra_cb_ID != CDB_ID_DATTR || cx.dattr_range_type == VX_UNKNOWN || !refers || sound)
+        return;
+    size_t record = staged_tbl(cx.cb_rsrc_class.*records)->used();
+    for (size_t bound : {offsetof(rsrc_dattr_t, ra_min_value), offsetof(rsrc_dattr_t, ra_max_value)})
+        cx.strays.push_back({cx.rsrc_class_count, records, record + bound});
+}
 
 void init_dattr_tbl(cdgen &cx) {
     start_dattr(cx, resource_kind);

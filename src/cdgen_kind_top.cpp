@@ -3,6 +3,7 @@
 #include "cdgen_kind.h"
 
 #include <cstdlib>
+#include <type_traits>
 
 namespace {
 
@@ -60,10 +61,13 @@ template <class Attribute>
 void flush_raw(cdgen &cx, Attribute &attr, cdb_ref_t rsrc_class_t::*records, vx_uint16_t found) {
     if (attr.ra_cb_ID == 0)
         return;
-    append_record(cx, staged_tbl(cx.cb_rsrc_class.*records), attr);
-    attr.ra_cb_ID = 0;
+    tbl *filed = staged_tbl(cx.cb_rsrc_class.*records);
     if (!found && attr.u_ra_valid_vals.offset[0] == 0)
-        cx.listless.push_back({cx.rsrc_class_count, records, sizeof(Attribute) - offsetof(Attribute, u_ra_valid_vals)});
+        cx.strays.push_back({cx.rsrc_class_count, records, filed->used() + offsetof(Attribute, u_ra_valid_vals)});
+    if constexpr (std::is_same_v<Attribute, rsrc_dattr_t>)
+        note_stray_range(cx, attr, records);
+    append_record(cx, filed, attr);
+    attr.ra_cb_ID = 0;
 }
 
 } // namespace

@@ -321,10 +321,21 @@ void swap_section_of(const cdb_dsect_anchor_t &anchor, const swap_section &secti
     }
 }
 
-/* References of 0 that lead nowhere say so while the image is walked. */
-void set_words(char *image, std::span<const size_t> places, vx_uint32_t value) {
-    for (size_t place : places)
-        memcpy(image + place, &value, sizeof value);
+/* Words that look like references and are none say so while the image is walked. Returns what they were. */
+std::vector<vx_uint32_t> hide_strays(char *image, std::span<const size_t> places) {
+    std::vector<vx_uint32_t> words;
+    for (size_t place : places) {
+        words.push_back(load_word(image + place));
+        store(image + place, vx_uint32_t{CDB_NONE});
+    }
+    return words;
+}
+
+void restore_strays(char *image, std::span<const size_t> places, std::span<const vx_uint32_t> words) {
+    for (size_t i = 0; i < places.size(); ++i) {
+        store(image + places[i], words[i]);
+        swap_word(image + places[i]);
+    }
 }
 
 } // namespace
@@ -433,7 +444,7 @@ void swap_depends(char *first, vx_uint32_t count, swap_area &sbase_p, swap_area 
 void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere) {
     auto header = load<orb_cdb_header_t>(cdb_hdr_p);
     size_t file_size = size_t{header.cdb_hdr_length} + sizeof header.cdb_hdr_length;
-    set_words(cdb_hdr_p, nowhere, CDB_NONE);
+    std::vector<vx_uint32_t> strays = hide_strays(cdb_hdr_p, nowhere);
     swap_section file = {cdb_hdr_p, file_size};
     char *anchor_p = cdb_hdr_p + sizeof header;
     vx_uint32_t n = file.records_inside(sizeof header, header.cdb_hdr_dsect_count, sizeof(cdb_dsect_anchor_t));
@@ -443,7 +454,7 @@ void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere) {
             swap_section_of(anchor, {cdb_hdr_p + anchor.cda_offset, anchor.cda_length});
         swap_fields<cdb::cdb_dsect_anchor_fields>(anchor_p);
     }
-    set_words(cdb_hdr_p, nowhere, 0);
+    restore_strays(cdb_hdr_p, nowhere, strays);
     swap_fields<cdb::cdb_header_fields>(cdb_hdr_p);
     vx_uint32_t checksum = cdb_checksum(cdb_hdr_p, load_word(cdb_hdr_p), header.cdb_hdr_length);
     memcpy(cdb_hdr_p + offsetof(orb_cdb_header_t, cdb_hdr_checksum), &checksum, sizeof checksum);

@@ -744,17 +744,17 @@ TEST_F(ImageFile, PlacesOfReferencesThatLeadNowhereAreHandedToTheReversal) {
         add_class(two_of_each);
     add_mgr(0);
     add_map(0);
-    cx.listless = {{0, &rsrc_class_t::u_rc_pattrsC, 24}, /* 72 - 48 */
-                   {0, &rsrc_class_t::u_rc_dattrs, 72},  /* 136 - 64 */
-                   {1, &rsrc_class_t::u_rc_dattrsC, 72},
-                   {1, &rsrc_class_t::u_rc_pattrs, 24}};
+    cx.strays = {{0, &rsrc_class_t::u_rc_pattrsC, 72 + 48},
+                 {0, &rsrc_class_t::u_rc_dattrs, 136 + 64},
+                 {1, &rsrc_class_t::u_rc_dattrsC, 136 + 64},
+                 {1, &rsrc_class_t::u_rc_pattrs, 72 + 48}};
     for (size_t n : {size_t{0}, size_t{1}}) {
         char *list = staged_tbl(staged_class(n).u_rc_valid_vals)->tbl_base;
         memcpy(list, image(32).u32(4, 1).at(0), 32);
         staged_class(n).rc_num_errors = staged_class(n).rc_num_depends = 0;
     }
-    for (const listless_record &l : cx.listless)
-        memset(staged_tbl(staged_class(static_cast<size_t>(l.rsrc_class)).*l.records)->tbl_next - l.from_end, 0, 8);
+    for (const stray_reference &s : cx.strays)
+        memset(staged_tbl(staged_class(static_cast<size_t>(s.rsrc_class)).*s.records)->tbl_base + s.offset, 0, 8);
     cx.swap_endianness = 1;
     ASSERT_EQ(build(), "none");
     constexpr size_t FIRST = 144, SECOND = 144 + 224 + 832 + 32;

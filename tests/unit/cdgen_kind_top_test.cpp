@@ -202,18 +202,18 @@ TEST(ResourceClass, RemembersFlushedAttributesWithoutAList) {
     opened c;
     c.cx.rsrc_class_count = 6;
     cmplt_class_tbl(c.cx); /* the persistent class kind says from the start that it has none */
-    ASSERT_EQ(c.cx.listless.size(), 3U);
+    ASSERT_EQ(c.cx.strays.size(), 3U);
     const std::pair<cdb_ref_t rsrc_class_t::*, size_t> rows[] = {
-        {&rsrc_class_t::u_rc_dattrsC, 72}, {&rsrc_class_t::u_rc_pattrs, 24}, {&rsrc_class_t::u_rc_dattrs, 72}};
+        {&rsrc_class_t::u_rc_dattrsC, 64}, {&rsrc_class_t::u_rc_pattrs, 48}, {&rsrc_class_t::u_rc_dattrs, 64}};
     for (size_t i = 0; i < 3; ++i) {
-        EXPECT_EQ(c.cx.listless[i].rsrc_class, 6);
-        EXPECT_EQ(c.cx.listless[i].records, rows[i].first);
-        EXPECT_EQ(c.cx.listless[i].from_end, rows[i].second);
+        EXPECT_EQ(c.cx.strays[i].rsrc_class, 6);
+        EXPECT_EQ(c.cx.strays[i].records, rows[i].first);
+        EXPECT_EQ(c.cx.strays[i].offset, rows[i].second);
     }
     opened with_lists;
     with_lists.cx.pattr_vv_found = with_lists.cx.dattr_vv_found = with_lists.cx.dattrC_vv_found = 1;
     cmplt_class_tbl(with_lists.cx);
-    EXPECT_TRUE(with_lists.cx.listless.empty());
+    EXPECT_TRUE(with_lists.cx.strays.empty());
 }
 
 /* ---- The locator ----------------------------------------------------------------------------------------------- */

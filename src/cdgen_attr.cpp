@@ -26,7 +26,7 @@ name_value split_line(cdgen &cx, const attr_text &text) {
         source_error(cx, "Missing '=' after attribute name");
     *equals = '\0';
     char *value = equals + 1;
-    if (strcmp(value, "\"\"") == 0)
+    if (value[0] == '"' && value[1] == '"' && value[2] == '\0')
         return {};
     char *unquoted = strip_quotes(value, &end);
     if (unquoted == nullptr)

@@ -142,8 +142,9 @@ void store_variety(const attr_line &line) {
     auto list = load<vx_uint32_t>(field_of(line));
     size_t at = next_entry(line.cx, varieties, list, &variety_list_t::vl_count, offsetof(variety_list_t, vl_values),
                            sizeof(vl_entry_t));
-    auto high_val = static_cast<vx_uint32_t>(integer(line, high));
-    if (strchr(high, ',') != nullptr)
+    char *rest = nullptr;
+    auto high_val = static_cast<vx_uint32_t>(int_from_text(line.cx, high, &rest, 0));
+    if (*rest != '\0' && strchr(rest, ',') != nullptr)
         source_error(line.cx, "Too many varieties");
     auto low_val = static_cast<vx_uint32_t>(integer(line, line.value));
     *record_at<vl_entry_t>(line.cx, varieties, at) = {low_val, high_val};

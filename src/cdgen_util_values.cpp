@@ -45,21 +45,34 @@ const char *plain_decimal(const char *text, vx_uint64_t *value) {
     return p;
 }
 
-/* Digits with or without a fraction, so few that they and the power of ten are exact: the one division rounds as the C
- * library does. False where its rules are wanted. */
-template <class Float> bool plain_fraction(const char *text, Float *value) {
+/* The same with a minus sign in front, or without. */
+const char *plain_signed(const char *text, vx_int64_t *value) {
+    bool negative = *text == '-';
     vx_uint64_t n = 0;
-    const char *p = plain_decimal(text, &n);
+    const char *end = plain_decimal(text + negative, &n);
+    *value = negative ? -static_cast<vx_int64_t>(n) : static_cast<vx_int64_t>(n);
+    return end;
+}
+
+/* Digits with or without a fraction, such that they as an integer and the power of ten are exact: the one division
+ * rounds as the C library does. False where its rules are wanted. */
+template <class Float> bool plain_fraction(const char *text, Float *value) {
+    constexpr vx_uint64_t EXACT = vx_uint64_t{1} << std::numeric_limits<Float>::digits;
+    constexpr int EXACT_POWER = sizeof(Float) == sizeof(float) ? 10 : 18; /* of ten; and no overflow of n */
+    bool negative = *text == '-';
+    vx_uint64_t n = 0;
+    const char *p = plain_decimal(text + negative, &n);
     if (p == nullptr)
         return false;
-    auto digits = p - text;
+    auto digits = p - text - negative;
     Float scale = 1;
     if (*p == '.')
         for (unsigned digit = 0; (digit = digit_of(*++p)) <= 9; ++digits, scale *= 10)
             n = n * 10 + digit;
-    *value = static_cast<Float>(n) / scale;
+    Float size = static_cast<Float>(n) / scale;
+    *value = negative ? -size : size;
     bool rounded_once = FLT_EVAL_METHOD == 0 || FLT_EVAL_METHOD == 1;
-    return rounded_once && *p == '\0' && digits <= std::numeric_limits<Float>::digits10;
+    return rounded_once && *p == '\0' && n <= EXACT && digits <= EXACT_POWER;
 }
 
 [[gnu::noinline]] long library_integer(cdgen &cx, const char *text, char **end, int base) {
@@ -68,11 +81,8 @@ template <class Float> bool plain_fraction(const char *text, Float *value) {
 
 /* The whole text as a decimal integer: false when anything else follows. */
 bool whole_signed(cdgen &cx, const char *text, vx_int64_t *value) {
-    vx_uint64_t plain = 0;
-    if (const char *end = plain_decimal(text, &plain)) {
-        *value = static_cast<vx_int64_t>(plain);
+    if (const char *end = plain_signed(text, value))
         return *end == '\0';
-    }
     char *end = nullptr;
     *value = converted(cx, [&] { return strtoll(text, &end, 10); });
     return *end == '\0';

@@ -14,7 +14,6 @@ template <class Record> struct kind_row {
     void (*init)(cdgen &);
     void (*complete)(cdgen &);
     vx_uint16_t cdgen::*vv_found;
-    const char *no_class;
 
     std::string name() const {
         return sc_tables[id].sc_name;
@@ -24,35 +23,20 @@ template <class Record> struct kind_row {
 using pattr_row = kind_row<rsrc_pattr_t>;
 using dattr_row = kind_row<rsrc_dattr_t>;
 
-const pattr_row P = {SC_PERSISTENT_RESOURCE_ATTRIBUTE,
-                     &cdgen::cb_rsrc_pattr,
-                     &rsrc_class_t::u_rc_pattrs,
-                     0x43444239,
-                     init_pattr_tbl,
-                     cmplt_pattr_tbl,
-                     &cdgen::pattr_vv_found,
-                     "No class for PersistentAttribute"};
-const pattr_row PC = {SC_PERSISTENT_CLASS_ATTRIBUTE,
-                      &cdgen::cb_rsrc_pattrC,
-                      &rsrc_class_t::u_rc_pattrsC,
-                      0x43444237,
-                      init_pattrC_tbl,
-                      cmplt_pattrC_tbl,
-                      &cdgen::pattrC_vv_found,
-                      "No class for pattr"};
-const dattr_row D = {SC_DYNAMIC_RESOURCE_ATTRIBUTE,
-                     &cdgen::cb_rsrc_dattr,
-                     &rsrc_class_t::u_rc_dattrs,
-                     0x43444261,
-                     init_dattr_tbl,
-                     cmplt_dattr_tbl,
-                     &cdgen::dattr_vv_found,
-                     "No class for DynamicAttribute"};
-const dattr_row DC = {
-    SC_DYNAMIC_CLASS_ATTRIBUTE, &cdgen::cb_rsrc_dattrC,  &rsrc_class_t::u_rc_dattrsC,    0x43444238, init_dattrC_tbl,
-    cmplt_dattrC_tbl,           &cdgen::dattrC_vv_found, "No class for DynamicAttribute"};
-const pattr_row *const PATTRS[] = {&P, &PC};
-const dattr_row *const DATTRS[] = {&D, &DC};
+const pattr_row PATTRS[] = {
+    {SC_PERSISTENT_RESOURCE_ATTRIBUTE, &cdgen::cb_rsrc_pattr, &rsrc_class_t::u_rc_pattrs, 0x43444239, init_pattr_tbl,
+     cmplt_pattr_tbl, &cdgen::pattr_vv_found},
+    {SC_PERSISTENT_CLASS_ATTRIBUTE, &cdgen::cb_rsrc_pattrC, &rsrc_class_t::u_rc_pattrsC, 0x43444237, init_pattrC_tbl,
+     cmplt_pattrC_tbl, &cdgen::pattrC_vv_found},
+};
+const dattr_row DATTRS[] = {
+    {SC_DYNAMIC_RESOURCE_ATTRIBUTE, &cdgen::cb_rsrc_dattr, &rsrc_class_t::u_rc_dattrs, 0x43444261, init_dattr_tbl,
+     cmplt_dattr_tbl, &cdgen::dattr_vv_found},
+    {SC_DYNAMIC_CLASS_ATTRIBUTE, &cdgen::cb_rsrc_dattrC, &rsrc_class_t::u_rc_dattrsC, 0x43444238, init_dattrC_tbl,
+     cmplt_dattrC_tbl, &cdgen::dattrC_vv_found},
+};
+const pattr_row &P = PATTRS[0], &PC = PATTRS[1];
+const dattr_row &D = DATTRS[0], &DC = DATTRS[1];
 
 /* The source's only attribute of a kind, completed. */
 template <class Record> Record completed(compilation &c, const kind_row<Record> &kind, const std::string &text) {
@@ -80,64 +64,65 @@ constexpr cdb_ref_t ABSENT = {{0xFFFFFFFF, 0}};
 /* ---- Opening --------------------------------------------------------------------------------------------------- */
 
 TEST(PersistentAttribute, OpensAsEmptyRecord) {
-    for (const pattr_row *kind : PATTRS) {
+    for (const pattr_row &kind : PATTRS) {
         compilation c;
         init_class_tbl(c.cx);
-        mk_vty_sec(c.cx); /* another list before its own */
-        memset(&(c.cx.*kind->record), 0, sizeof(rsrc_pattr_t));
-        (c.cx.*kind->record).ra_group_id = 3; /* of an earlier one */
+        mk_vty_sec(c.cx);                    /* another list before its own */
+        (c.cx.*kind.record).ra_group_id = 3; /* of an earlier one */
         c.cx.vvdisp = 0;
-        c.cx.*kind->vv_found = 1;
-        kind->init(c.cx);
+        c.cx.*kind.vv_found = 1;
+        kind.init(c.cx);
         rsrc_pattr_t expected = {};
-        expected.ra_cb_ID = kind->cb_id;
+        expected.ra_cb_ID = kind.cb_id;
         expected.u_ra_variety_list = {{16, 0}};
         expected.u_ra_sd = ABSENT;
-        if (kind == &PC) /* deliberate: the other one at its completion */
+        if (&kind == &PC) /* deliberate: the other one at its completion */
             expected.u_ra_valid_vals = ABSENT;
         expected.ra_max_sd_idx = 0xFFFF;
-        EXPECT_EQ(bytes_of(c.cx.*kind->record), bytes_of(expected));
+        EXPECT_EQ(bytes_of(c.cx.*kind.record), bytes_of(expected));
         EXPECT_FALSE(c.cx.vvdisp.has_value());
-        EXPECT_EQ(c.cx.*kind->vv_found, 0U);
+        EXPECT_EQ(c.cx.*kind.vv_found, 0U);
     }
 }
 
 TEST(DynamicAttribute, OpensAsEmptyRecord) {
-    for (const dattr_row *kind : DATTRS) {
+    for (const dattr_row &kind : DATTRS) {
         compilation c;
         init_class_tbl(c.cx);
         mk_vty_sec(c.cx);
-        (c.cx.*kind->record).ra_group_id = 3;
+        (c.cx.*kind.record).ra_group_id = 3;
         c.cx.vvdisp = 0;
-        c.cx.*kind->vv_found = 1;
-        kind->init(c.cx);
+        c.cx.*kind.vv_found = 1;
+        kind.init(c.cx);
         rsrc_dattr_t expected = {};
-        expected.ra_cb_ID = kind->cb_id;
+        expected.ra_cb_ID = kind.cb_id;
         expected.u_ra_variety_list = {{16, 0}};
         expected.u_ra_express = expected.u_ra_vclass = expected.u_ra_rearm_expr = expected.u_ra_sd = ABSENT;
         expected.ra_max_sd_idx = 0xFFFF;
-        EXPECT_EQ(bytes_of(c.cx.*kind->record), bytes_of(expected));
+        EXPECT_EQ(bytes_of(c.cx.*kind.record), bytes_of(expected));
         EXPECT_FALSE(c.cx.vvdisp.has_value());
-        EXPECT_EQ(c.cx.*kind->vv_found, 0U);
+        EXPECT_EQ(c.cx.*kind.vv_found, 0U);
     }
 }
 
-template <class Record> void expect_class_needed(const kind_row<Record> &kind) {
+template <class Record> void expect_class_needed(const kind_row<Record> &kind, const char *message) {
     opened c;
     for (auto step : {kind.init, kind.complete}) {
         c.cx.cb_rsrc_class.rc_cb_ID = 0;
-        EXPECT_EQ(ending_of([&] { step(c.cx); }), (ending{kind.no_class, LINE, 1}));
+        EXPECT_EQ(ending_of([&] { step(c.cx); }), (ending{message, LINE, 1}));
     }
+    compilation nothing_open;
+    EXPECT_EQ(nothing_open.reading(kind.name()), (ending{message, 1, 1}));
 }
 
 TEST(PersistentAttribute, NeedsAClass) {
-    expect_class_needed(P);
-    expect_class_needed(PC);
+    expect_class_needed(P, "No class for PersistentAttribute");
+    expect_class_needed(PC, "No class for pattr");
 }
 
 TEST(DynamicAttribute, NeedsAClass) {
-    expect_class_needed(D);
-    expect_class_needed(DC);
+    expect_class_needed(D, "No class for DynamicAttribute");
+    expect_class_needed(DC, "No class for DynamicAttribute");
 }
 
 /* ---- Completing ------------------------------------------------------------------------------------------------ */
@@ -175,12 +160,12 @@ TEST(DynamicAttribute, NeedsAllItsRequiredAttributes) {
 }
 
 TEST(PersistentAttribute, HoldsWhatItsStanzaSays) {
-    for (const pattr_row *kind : PATTRS) {
+    for (const pattr_row &kind : PATTRS) {
         compilation c;
         rsrc_pattr_t attr = completed_pattr(
-            c, *kind, "Int32",
+            c, kind, "Int32",
             {"GroupID=17", "GroupName=18", "Properties=ReqdForDefine", "ValidValue=19", "VarietyRange=16,20"});
-        EXPECT_EQ(attr.ra_cb_ID, kind->cb_id);
+        EXPECT_EQ(attr.ra_cb_ID, kind.cb_id);
         EXPECT_EQ(c.string_at(attr.u_ra_name.offset[0]), "P");
         EXPECT_EQ(attr.ra_dscr_msgid, 11U);
         EXPECT_EQ(attr.ra_disp_msgid, 12U);
@@ -194,18 +179,19 @@ TEST(PersistentAttribute, HoldsWhatItsStanzaSays) {
         EXPECT_TRUE(is_absent(attr.u_ra_sd));
         EXPECT_EQ(attr.ra_max_sd_idx, 0xFFFFU);
         EXPECT_EQ(attr.ra_dflt_value.val_uint64, 0U);
+        EXPECT_EQ(c.cx.*kind.vv_found, 0U);
     }
 }
 
 TEST(DynamicAttribute, HoldsWhatItsStanzaSays) {
-    for (const dattr_row *kind : DATTRS) {
+    for (const dattr_row &kind : DATTRS) {
         compilation c;
         rsrc_dattr_t attr =
-            completed_dattr(c, *kind, "Int32",
+            completed_dattr(c, kind, "Int32",
                             {"GroupID=26", "GroupName=27", "Properties=QryReqsMonitoring", "ValidStateValue=28",
                              "Expression=X", "ExpressionDescription=29", "ReArmExpression=R", "ReArmDescription=30",
                              "VariableClass=V", "Range=31,32", "InitialValue=33"});
-        EXPECT_EQ(attr.ra_cb_ID, kind->cb_id);
+        EXPECT_EQ(attr.ra_cb_ID, kind.cb_id);
         EXPECT_EQ(c.string_at(attr.u_ra_name.offset[0]), "D");
         EXPECT_EQ(c.string_at(attr.u_ra_vclass.offset[0]), "V");
         EXPECT_EQ(c.string_at(attr.u_ra_express.offset[0]), "X");
@@ -226,6 +212,7 @@ TEST(DynamicAttribute, HoldsWhatItsStanzaSays) {
         EXPECT_EQ(attr.ra_data_type, VX_INT32);
         EXPECT_EQ(attr.ra_var_type, ORB_QUANTITY);
         EXPECT_TRUE(is_absent(attr.u_ra_sd));
+        EXPECT_EQ(c.cx.*kind.vv_found, 0U);
     }
 }
 
@@ -247,15 +234,15 @@ void expect_stanza_order(const kind_row<Record> &kind, const std::string &first,
 }
 
 TEST(PersistentAttribute, StandsInStanzaOrder) {
-    for (const pattr_row *kind : PATTRS)
-        expect_stanza_order(*kind, pattr(kind->name(), "Int32", {"ValidValue=1", "GroupID=1", "GroupName=2"}),
-                            pattr(kind->name(), "UInt32"));
+    for (const pattr_row &kind : PATTRS)
+        expect_stanza_order(kind, pattr(kind.name(), "Int32", {"ValidValue=1", "GroupID=1", "GroupName=2"}),
+                            pattr(kind.name(), "UInt32"));
 }
 
 TEST(DynamicAttribute, StandsInStanzaOrder) {
-    for (const dattr_row *kind : DATTRS)
-        expect_stanza_order(*kind, dattr(kind->name(), "Int32", {"ValidStateValue=1", "GroupID=1", "GroupName=2"}),
-                            dattr(kind->name(), "UInt32"));
+    for (const dattr_row &kind : DATTRS)
+        expect_stanza_order(kind, dattr(kind.name(), "Int32", {"ValidStateValue=1", "GroupID=1", "GroupName=2"}),
+                            dattr(kind.name(), "UInt32"));
 }
 
 TEST(PersistentAttribute, CannotBeDefinedUnlessItSaysSo) {
@@ -264,23 +251,38 @@ TEST(PersistentAttribute, CannotBeDefinedUnlessItSaysSo) {
         {"Properties=ReqdForDefine", 0x2},  {"Properties=OptForDefine", 0x8},
         {"Properties=InvalForDefine", 0x4}, {"Properties=ReqdForDefine,InvalForDefine", 0x6},
     };
-    for (const pattr_row *kind : PATTRS)
+    for (const pattr_row &kind : PATTRS)
         for (auto [line, props] : rows) {
             compilation c;
-            EXPECT_EQ(completed_pattr(c, *kind, "Int32", {line}).ra_props, props) << line;
+            EXPECT_EQ(completed_pattr(c, kind, "Int32", {line}).ra_props, props) << line;
         }
 }
 
-/* A group of 0 is one; a group that was not given is not, whatever stands in the record. */
+/* Whatever stands in the record. A group of 0 is one. */
+template <class Record> void expect_no_group_unless_given(const kind_row<Record> &kind) {
+    const std::pair<std::vector<std::string>, std::pair<int, int>> rows[] = {
+        {{}, {255, 0}}, {{"Properties=Public"}, {255, 0}}, {{"GroupID=0"}, {0, 0}}, {{"GroupName=9"}, {255, 9}}};
+    for (const auto &[given, group] : rows) {
+        opened c;
+        (c.cx.*kind.record).ra_data_type = VX_INT32;
+        (c.cx.*kind.record).ra_group_id = (c.cx.*kind.record).ra_group_msgid = 5;
+        c.require_nothing(kind.id);
+        for (const std::string &line : given)
+            EXPECT_EQ(fed(c, kind.id, line), WELL);
+        kind.complete(c.cx);
+        EXPECT_EQ(c.filed<Record>(kind.records)[0].ra_group_id, group.first);
+        EXPECT_EQ(c.filed<Record>(kind.records)[0].ra_group_msgid, group.second);
+    }
+}
+
 TEST(PersistentAttribute, GroupIsNoneUnlessGiven) {
-    compilation c;
-    rsrc_pattr_t attr = completed_pattr(c, P, "Int32", {"GroupID=0"});
-    EXPECT_EQ(attr.ra_group_id, 0U);
-    EXPECT_EQ(attr.ra_group_msgid, 0U);
-    compilation other;
-    attr = completed_pattr(other, PC, "Int32", {"GroupName=9", "Properties=Public"});
-    EXPECT_EQ(attr.ra_group_id, 255U);
-    EXPECT_EQ(attr.ra_group_msgid, 9U);
+    expect_no_group_unless_given(P);
+    expect_no_group_unless_given(PC);
+}
+
+TEST(DynamicAttribute, GroupIsNoneUnlessGiven) {
+    expect_no_group_unless_given(D);
+    expect_no_group_unless_given(DC);
 }
 
 /* ---- Values that were not given -------------------------------------------------------------------------------- */
@@ -312,10 +314,10 @@ TEST(PersistentAttribute, DefaultIsItsTypes) {
         {"BinaryArray", cell32(8), 40},
         {"RHArray", cell32(8), 48},
     };
-    for (const pattr_row *kind : PATTRS)
+    for (const pattr_row &kind : PATTRS)
         for (const default_row &row : rows) {
             compilation c;
-            EXPECT_EQ(completed_pattr(c, *kind, row.type).ra_dflt_value.val_uint64, row.value) << row.type;
+            EXPECT_EQ(completed_pattr(c, kind, row.type).ra_dflt_value.val_uint64, row.value) << row.type;
             EXPECT_EQ(c.table(&rsrc_class_t::u_rc_strings)->used(), row.used) << row.type;
         }
 }
@@ -349,10 +351,10 @@ const dynamic_default_row DYNAMIC_DEFAULTS[] = {
 };
 
 TEST(DynamicAttribute, RangeAndInitialValueAreItsTypes) {
-    for (const dattr_row *kind : DATTRS)
+    for (const dattr_row &kind : DATTRS)
         for (const dynamic_default_row &row : DYNAMIC_DEFAULTS) {
             compilation c;
-            rsrc_dattr_t attr = completed_dattr(c, *kind, row.type);
+            rsrc_dattr_t attr = completed_dattr(c, kind, row.type);
             EXPECT_EQ(attr.ra_min_value.val_uint64, row.min) << row.type;
             EXPECT_EQ(attr.ra_max_value.val_uint64, row.max) << row.type;
             EXPECT_EQ(attr.ra_init_value.val_uint64, row.initial) << row.type;
@@ -416,19 +418,19 @@ template <class Record> ending completing(const kind_row<Record> &kind, int type
 }
 
 TEST(PersistentAttribute, TypeMustHaveADefault) {
-    for (const pattr_row *kind : PATTRS) {
-        EXPECT_EQ(completing(*kind, 0, 0), (ending{"copy_this_type default value error", LINE, 1}));
-        EXPECT_EQ(completing(*kind, 23, 0), (ending{"copy_this_type default value error", LINE, 1}));
-        EXPECT_EQ(completing(*kind, VX_SBS_PTR, 0), (ending{"VX_SBS_TYPE not supported", 0, 1}));
+    for (const pattr_row &kind : PATTRS) {
+        EXPECT_EQ(completing(kind, 0, 0), (ending{"copy_this_type default value error", LINE, 1}));
+        EXPECT_EQ(completing(kind, 23, 0), (ending{"copy_this_type default value error", LINE, 1}));
+        EXPECT_EQ(completing(kind, VX_SBS_PTR, 0), (ending{"VX_SBS_TYPE not supported", 0, 1}));
     }
 }
 
 TEST(DynamicAttribute, TypeMustHaveADefault) {
-    for (const dattr_row *kind : DATTRS) {
-        EXPECT_EQ(completing(*kind, 0, 0), (ending{"copy_this_type default min range error (dattr)", LINE, 1}));
-        EXPECT_EQ(completing(*kind, 0, 1), (ending{"copy_this_type default value error (dattr)", LINE, 1}));
-        EXPECT_EQ(completing(*kind, VX_SBS_PTR, 0), (ending{"VX_SBS_TYPE not supported", 0, 1}));
-        EXPECT_EQ(completing(*kind, VX_SBS_PTR, 1), (ending{"VX_SBS_TYPE not supported", 0, 1}));
+    for (const dattr_row &kind : DATTRS) {
+        EXPECT_EQ(completing(kind, 0, 0), (ending{"copy_this_type default min range error (dattr)", LINE, 1}));
+        EXPECT_EQ(completing(kind, 0, 1), (ending{"copy_this_type default value error (dattr)", LINE, 1}));
+        EXPECT_EQ(completing(kind, VX_SBS_PTR, 0), (ending{"VX_SBS_TYPE not supported", 0, 1}));
+        EXPECT_EQ(completing(kind, VX_SBS_PTR, 1), (ending{"VX_SBS_TYPE not supported", 0, 1}));
     }
 }
 
@@ -469,9 +471,9 @@ TEST(PersistentAttribute, NextStanzaHasNoneOfTheDefaults) {
 }
 
 TEST(DynamicAttribute, InitialValueServesBothKinds) {
-    for (const dattr_row *kind : DATTRS) {
+    for (const dattr_row &kind : DATTRS) {
         compilation c;
-        EXPECT_EQ(completed_dattr(c, *kind, "Int32", {"InitialValue=5"}).ra_init_value.val_uint64, cell32(5));
+        EXPECT_EQ(completed_dattr(c, kind, "Int32", {"InitialValue=5"}).ra_init_value.val_uint64, cell32(5));
     }
 }
 

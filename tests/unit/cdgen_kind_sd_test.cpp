@@ -249,31 +249,26 @@ TEST(Element, StandsBehindTheOnesBefore) {
 
 /* ---- Owners ---------------------------------------------------------------------------------------------------- */
 
-struct owner_row {
-    const char *kind;
-    const cdb_ref_t *(*field)(const cdgen &);
-};
-
-const owner_row CLASS_OWNERS[] = {
-    {"OnlineSDDefinition", [](const cdgen &cx) { return &cx.cb_rsrc_class.u_rc_online_input; }},
-    {"OfflineSDDefinition", [](const cdgen &cx) { return &cx.cb_rsrc_class.u_rc_offline_input; }},
-    {"DefineSDDefinition", [](const cdgen &cx) { return &cx.cb_rsrc_class.u_rc_def_input; }},
-    {"UndefineSDDefinition", [](const cdgen &cx) { return &cx.cb_rsrc_class.u_rc_undef_input; }},
-    {"ResetSDDefinition", [](const cdgen &cx) { return &cx.cb_rsrc_class.u_rc_reset_input; }},
+const std::pair<const char *, cdb_ref_t rsrc_class_t::*> CLASS_OWNERS[] = {
+    {"OnlineSDDefinition", &rsrc_class_t::u_rc_online_input},
+    {"OfflineSDDefinition", &rsrc_class_t::u_rc_offline_input},
+    {"DefineSDDefinition", &rsrc_class_t::u_rc_def_input},
+    {"UndefineSDDefinition", &rsrc_class_t::u_rc_undef_input},
+    {"ResetSDDefinition", &rsrc_class_t::u_rc_reset_input},
 };
 
 /* Runs of different kinds one after another, each counted from 0. */
 TEST(Run, OfTheClassBelongsToItsField) {
     compilation c;
     std::string text = CLASS;
-    for (const owner_row &row : CLASS_OWNERS)
-        text += element(row.kind, 0, "Int32") + element(row.kind, 1, "Int32") + element(row.kind, 2, "Int32");
+    for (auto [kind, field] : CLASS_OWNERS)
+        text += element(kind, 0, "Int32") + element(kind, 1, "Int32") + element(kind, 2, "Int32");
     c.read(text + "ResourceClass\n");
     vx_uint32_t section = 0;
-    for (const owner_row &row : CLASS_OWNERS) {
-        EXPECT_EQ(row.field(c.cx)->offset[0], section) << row.kind;
-        EXPECT_EQ(row.field(c.cx)->offset[1], 0U) << row.kind;
-        EXPECT_EQ(c.elements_at(*row.field(c.cx)).size(), 3U) << row.kind;
+    for (auto [kind, field] : CLASS_OWNERS) {
+        EXPECT_EQ((c.cx.cb_rsrc_class.*field).offset[0], section) << kind;
+        EXPECT_EQ((c.cx.cb_rsrc_class.*field).offset[1], 0U) << kind;
+        EXPECT_EQ(c.elements_at(c.cx.cb_rsrc_class.*field).size(), 3U) << kind;
         section += 8 + 3 * 32;
     }
 }

@@ -87,16 +87,17 @@ struct output_fd {
     int fd;
 };
 
-/* Emptied only once it is known not to be the source. */
+/* Emptied only once it is known not to be the source. Asked before it is opened: a source that has been deleted in the
+ * meantime may have left its inode number to the new file. */
 int create_output(cdgen &cx) {
-    output_fd out(above_stdio(open(cx.cdefname, O_RDWR | O_CREAT | O_CLOEXEC, 0644)));
     struct stat st = {};
+    if (stat(cx.cdefname, &st) == 0 && st.st_dev == cx.cdb_fp.device && st.st_ino == cx.cdb_fp.inode)
+        bld_error_exit(cx, "Cannot create CDB file: ", "it is the source file", nullptr, 1);
+    output_fd out(above_stdio(open(cx.cdefname, O_RDWR | O_CREAT | O_CLOEXEC, 0644)));
     if (out.fd < 0)
         cannot(cx, "Cannot create CDB file: ", errno);
     if (fstat(out.fd, &st) != 0)
         cannot(cx, "Cannot map CDB file: ", errno);
-    if (st.st_dev == cx.cdb_fp.device && st.st_ino == cx.cdb_fp.inode)
-        bld_error_exit(cx, "Cannot create CDB file: ", "it is the source file", nullptr, 1);
     if (S_ISREG(st.st_mode) && st.st_size > 0 && ftruncate(out.fd, 0) != 0)
         cannot(cx, "Cannot create CDB file: ", errno);
     return out.release();

@@ -96,7 +96,7 @@ struct finding {
 
 struct result {
     std::string file;
-    std::vector<finding> findings; /* by line */
+    std::vector<finding> findings; /* by line, its errors first, in the order in which they were met */
     size_t errors = 0;
     size_t warnings = 0;
 };

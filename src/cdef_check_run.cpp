@@ -483,8 +483,9 @@ void session::run() {
 result check_source(const std::string &path, const warning_set &wanted) {
     result checked = {.file = path, .findings = {}};
     std::make_unique<session>(path, wanted, checked)->run();
-    std::stable_sort(checked.findings.begin(), checked.findings.end(),
-                     [](const finding &a, const finding &b) { return a.at.line < b.at.line; });
+    std::stable_sort(checked.findings.begin(), checked.findings.end(), [](const finding &a, const finding &b) {
+        return std::pair(a.at.line, !a.error) < std::pair(b.at.line, !b.error);
+    });
     return checked;
 }
 

@@ -123,6 +123,9 @@ void session::watch_stanza_end(int next_kind) {
     }
     if (!seen.sd_run && out.errors == 0)
         warn(SD_WITHOUT_RUN, seen.sd_attribute, "attribute of structured data without elements: it has no value");
+    if (seen.sd_run && line.line == nullptr && cx.attr_dflt_val != nullptr)
+        warn(SD_RUN_AT_END, seen.sd_attribute,
+             "the elements end the file: the attribute is completed before them and has no value");
     seen.sd_attribute = {};
     seen.sd_run = false;
 }

@@ -78,13 +78,18 @@ finding &session::error(const fatal_exit &failure, const place &at) {
                             .name = "error",
                             .text = words_of(failure),
                             .at = at,
-                            .source = {},
+                            .source = raw,
                             .notes = {}});
     ++out.errors;
     return out.findings.back();
 }
 
 bool session::warn(warning_id id, const place &at, std::string text, std::vector<note> notes) {
+    return warn_at(id, at, raw, std::move(text), std::move(notes));
+}
+
+bool session::warn_at(warning_id id, const place &at, const std::string &source, std::string text,
+                      std::vector<note> notes) {
     const warning &known = warnings[id];
     if (!wanted[id])
         return false;
@@ -93,7 +98,7 @@ bool session::warn(warning_id id, const place &at, std::string text, std::vector
                             .name = known.name,
                             .text = std::move(text),
                             .at = at,
-                            .source = {},
+                            .source = source,
                             .notes = std::move(notes)});
     ++out.warnings;
     return true;
@@ -197,8 +202,8 @@ bool session::lost_index(int new_kind) const {
 
 void session::open_stanza(int new_kind, bool broken) {
     bool same_run = kind == new_kind && is_sd_kind(new_kind);
-    if (!same_run) {
-        index_lost = false;
+    if (!same_run) { /* after a mistake it may be the rest of a run */
+        index_lost = kind < 0 || cx.stanzas[index_of(kind)].broken;
         other_index = -1;
     }
     kind = new_kind;
@@ -207,8 +212,12 @@ void session::open_stanza(int new_kind, bool broken) {
     skipping = false;
     cx.stanzas[index_of(kind)].broken = broken;
     stanza_note &stanza = stanzas[index_of(kind)];
-    stanza = {};
+    stanza.given.fill(0);
+    stanza.failed = 0;
+    stanza.misplaced = false;
+    stanza.data_type = {};
     stanza.header = all_of_line();
+    stanza.source = raw;
     if (kind == SC_CLASS_TO_MANAGER_MAPPING)
         map_line = cx.linenum;
 }
@@ -226,16 +235,19 @@ bool session::recover_header(const fatal_exit &failure, int new_kind) {
     if (cx.cb_rsrc_class.rc_cb_ID == 0 && std::string_view(failure.msg).starts_with("No class for")) {
         if (!header_lost)
             add_notes(error(failure, all_of_line()), failure, new_kind);
+        header_told = true;
         forge_class();
         return true;
     }
     bool no_attribute = is_message(known, "S110");
-    bool follows = no_attribute && (skipping || (kind >= 0 && cx.stanzas[index_of(kind)].broken));
-    if (!follows && may_follow(failure))
+    bool told = out.errors > header_errors || kind < 0 || cx.stanzas[index_of(kind)].broken;
+    bool consequence = no_attribute && told && out.errors > 0;
+    if (!consequence && may_follow(failure))
         add_notes(error(failure, all_of_line()), failure, new_kind);
     if (no_attribute) {
         finish_run_by_hand(new_kind);
-        open_stanza(new_kind, false);
+        open_stanza(new_kind, true);
+        index_lost = true;
     } else {
         skip_stanza();
     }
@@ -245,6 +257,9 @@ bool session::recover_header(const fatal_exit &failure, int new_kind) {
 /* A header that names no kind: of an attribute line without its blank, a near miss, or lost. */
 void session::unknown_header(const attr_text &text, const fatal_exit &failure) {
     std::string_view name(text.name, static_cast<size_t>(text.end - text.name));
+    if (rest_of_line && !out.findings.empty() && out.findings.back().error &&
+        out.findings.back().at.line + 1 == cx.linenum)
+        return; /* all of the line has been told of */
     finding &found = error(failure, all_of_line());
     if (raw.ends_with('\r')) {
         strip_returns = true;
@@ -255,18 +270,26 @@ void session::unknown_header(const attr_text &text, const fatal_exit &failure) {
         if (meant >= 0)
             return take_header(again(stripped), false);
     }
-    if (name.find('=') != std::string_view::npos && kind >= 0) {
+    if (rest_of_line) {
+        found.notes.push_back({all_of_line(), "this is the rest of a line of more than 254 characters"});
+        return;
+    }
+    bool attribute = name.find('=') != std::string_view::npos &&
+                     set_table_id(std::string(name.substr(0, name.find('='))).c_str()) < 0;
+    if (attribute && kind >= 0) {
         found.notes.push_back({all_of_line(), "an attribute line begins with a blank or a tab"});
         std::string indented = std::string("\t").append(name);
         if (!skipping)
             take_quietly(indented);
         return;
     }
-    std::string_view meant = near_miss(name, stanza_names());
+    std::string_view meant = near_miss(name.substr(0, name.find('=')), stanza_names());
     found.notes.push_back({all_of_line(), suggestion(name, stanza_names())});
     if (!meant.empty())
         return take_header(again(meant), true);
     watch_stanza_end(-1);
+    if (kind >= 0 && cx.stanzas[index_of(kind)].req_mask != sc_tables[index_of(kind)].req_mask_cmplt)
+        cx.stanzas[index_of(kind)].broken = true; /* the rest of it may be what is skipped */
     header_lost = true;
     skip_stanza();
 }
@@ -298,13 +321,15 @@ void session::take_header(const attr_text &text, bool guessed) {
     bool resource_open = cx.cb_rsrc_dattr.ra_cb_ID != 0;
     bool class_open = cx.cb_rsrc_dattrC.ra_cb_ID != 0;
     bool no_index = lost_index(new_kind);
+    header_errors = out.errors;
+    header_told = false;
     for (int tries = 0; tries < HEADER_TRIES; ++tries) {
         auto before = std::tuple(cx.scp, cx.prev_scp, cx.curr_sd_scp, cx.state, cx.table_id);
         cx.completing = -1;
         try {
             take_line(cx, text);
             ranges_settled(resource_open, class_open, new_kind);
-            open_stanza(new_kind, guessed);
+            open_stanza(new_kind, guessed || header_told);
             index_lost = index_lost || no_index;
             return;
         } catch (const fatal_exit &failure) {
@@ -328,6 +353,19 @@ vx_uint32_t session::type_meant() const {
     return attr == nullptr ? LOST_NAME : bit_of(attr->ta_type);
 }
 
+/* Whether a line belongs to another stanza, as one before it did. Notes it if it is the first: a second name, or an
+ * attribute that this kind does not have. */
+bool session::misplaced(const fatal_exit &failure) {
+    const message &known = message_of(failure);
+    bool unknown = is_message(known, "S106") && (type_meant() & LOST_NAME) != 0;
+    bool repeated = is_message(known, "S109");
+    bool &before = stanzas[index_of(kind)].misplaced;
+    if (before)
+        return unknown || repeated || is_message(known, "S208");
+    before = unknown || (repeated && cx.latest.attr == &sc_tables[index_of(kind)].sc_attrs[0]);
+    return false;
+}
+
 void session::recover_attribute(const fatal_exit &failure) {
     const message &known = message_of(failure);
     if (kind < 0) { /* before any header */
@@ -345,7 +383,8 @@ void session::recover_attribute(const fatal_exit &failure) {
         untyped = state.broken && data_type == VX_UNKNOWN;
     }
     bool follows = (untyped && (type_bit & TYPED) != 0 && is_message(known, "S207")) ||
-                   (is_message(known, "S208") && (stanza.failed & (VALID_VALUES | LOST_NAME)) != 0);
+                   (is_message(known, "S208") && (stanza.failed & (VALID_VALUES | LOST_NAME)) != 0) ||
+                   misplaced(failure);
     bool index = is_message(known, "S210");
     if (index)
         follows = index_lost || (other_index >= 0 && cx.curr_sdeli == other_index);
@@ -399,12 +438,12 @@ void session::note_given() {
         given = cx.linenum;
     if (cx.latest.attr->ta_type == AT_MANAGER)
         manager_line = cx.linenum;
+    if (cx.latest.attr->ta_type == AT_SD_INDEX)
+        index_lost = false;
 }
 
 void session::take(const source_line &source) {
     raw.assign(source.begin, source.end);
-    lines.append(raw);
-    line_ends.push_back(lines.size());
     watch_line(source);
     source_line stripped = source;
     if (strip_returns && raw.ends_with('\r'))
@@ -452,16 +491,6 @@ void session::close_all() {
             error(failure, here(mark_kind::none));
     }
     watch_end();
-    for (finding &found : out.findings)
-        found.source = source_of(found.at.line);
-}
-
-std::string session::source_of(int number) const {
-    if (number <= 0)
-        return {};
-    auto at = static_cast<size_t>(number) - 1;
-    size_t begin = at == 0 ? 0 : line_ends[at - 1];
-    return lines.substr(begin, line_ends[at] - begin);
 }
 
 void session::run() {

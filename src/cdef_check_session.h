@@ -4,8 +4,8 @@
 
 #include "cdef_check.h"
 
+#include <functional>
 #include <optional>
-#include <unordered_map>
 
 namespace cdef::check {
 
@@ -19,25 +19,57 @@ struct stanza_note {
     std::array<int, ATTRS_MAX> given = {}; /* line of each attribute, by its position in the kind; 0: none */
     vx_uint32_t failed = 0;                /* bits by attr_type, of attributes whose value was refused */
     place data_type;                       /* the value of its DataType */
+    bool misplaced = false;                /* lines of another stanza seem to be in it */
+    std::string source;                    /* the header's line */
 };
 
 /* A name or a number at a place of the source. */
 struct mention {
     place at;
     std::string text;
+    std::string source; /* the line */
 };
 
 /* A Range that has not yet been settled with its attribute. */
 struct pending_range {
     place at;
     int kind;
-    int stanza; /* line of its header */
+    std::string source; /* the line */
 };
 
-/* Names and numbers of one kind, with the line that gave each first. */
+/* Texts, with the line that gave each first. There may be very many. */
+class first_lines {
+public:
+    /* The line for a text, which is 0 if it is a new one. */
+    int &of(std::string_view text);
+    bool has(std::string_view text) const;
+    /* All texts; they stay as long as none is added. */
+    name_list all() const;
+    void clear();
+
+private:
+    struct entry {
+        size_t hash;
+        size_t begin;
+        size_t length;
+        int line;
+    };
+
+    size_t slot_of(std::string_view text, size_t hash) const;
+    void grow();
+    std::string_view text_of(const entry &each) const {
+        return std::string_view(texts).substr(each.begin, each.length);
+    }
+
+    std::string texts;
+    std::vector<entry> entries;
+    std::vector<unsigned> slots; /* positions in entries, from 1; 0 is free */
+};
+
+/* Names and numbers of one kind. */
 struct known_values {
-    std::unordered_map<std::string, int> names;
-    std::unordered_map<long, int> ids;
+    first_lines names;
+    first_lines ids;
 };
 
 /* What the warnings need to remember. */
@@ -45,12 +77,12 @@ struct watch {
     std::array<known_values, SC_COUNT> known; /* of the current class, or run */
     std::vector<pending_range> ranges;
     std::vector<mention> variable_classes; /* named by attributes */
-    name_list variable_class_names;
-    std::unordered_map<std::string, int> defined_variable_classes;
+    first_lines defined_variable_classes;
     std::optional<mention> locator;
-    place sd_attribute;  /* the header of the latest SD-typed attribute whose run may still come, or goes on; */
-    bool sd_run = false; /* and that it goes on */
-    int piece = 0;       /* the line that filled a whole piece, if the one before did */
+    std::string sd_source; /* the line of */
+    place sd_attribute;    /* the header of the latest SD-typed attribute whose run may still come, or goes on; */
+    bool sd_run = false;   /* and that it goes on */
+    int piece = 0;         /* the line that filled a whole piece, if the one before did */
     bool carriage_returns = false;
 };
 
@@ -68,7 +100,7 @@ struct session {
     void note_given();
     bool lost_index(int new_kind) const;
     vx_uint32_t type_meant() const;
-    std::string source_of(int number) const;
+    bool misplaced(const fatal_exit &failure);
     void take_attribute(const attr_text &text);
     bool recover_header(const fatal_exit &failure, int kind);
     void recover_attribute(const fatal_exit &failure);
@@ -84,6 +116,8 @@ struct session {
 
     finding &error(const fatal_exit &failure, const place &at);
     bool warn(warning_id id, const place &at, std::string text, std::vector<note> notes = {});
+    bool warn_at(warning_id id, const place &at, const std::string &source, std::string text,
+                 std::vector<note> notes = {});
 
     /* Places of the current line. */
     place here(mark_kind kind, const fatal_exit *failure = nullptr) const;
@@ -104,6 +138,8 @@ struct session {
     void watch_bounds();
     void watch_version();
     void watch_name();
+    void watch_first(warning_id id, int &first, const place &at, const char *what);
+    std::string_view value_text() const;
     void watch_range();
     void watch_quotes();
     void ranges_settled(bool resource_was_open, bool class_was_open, int kind);
@@ -120,14 +156,15 @@ struct session {
     int sd_kind = SC_PATTR_SD_DEFINITION; /* of the latest run */
     bool class_forged = false;            /* the class has no stanza */
     int overflow_line = 0;                /* of the latest number that left its mark on later ones */
-    std::string lines;                    /* all so far, and where each ends */
-    std::vector<size_t> line_ends;
-    std::vector<mention> odd_elements; /* DataType lines of the run that its default may fail for */
-    bool skipping = false;             /* nothing of the current stanza can be made sense of */
-    bool header_lost = false;          /* there was a stanza that could have been any */
-    bool strip_returns = false;        /* the file has been found to have them everywhere */
-    bool index_lost = false;           /* the run's indexes have been found wrong */
-    int other_index = -1;              /* an index that may be right as well, once one was wrong */
+    std::vector<mention> odd_elements;    /* DataType lines of the run that its default may fail for */
+    bool skipping = false;                /* nothing of the current stanza can be made sense of */
+    bool header_lost = false;             /* there was a stanza that could have been any */
+    bool strip_returns = false;           /* the file has been found to have them everywhere */
+    bool index_lost = false;              /* the run's indexes have been found wrong */
+    int other_index = -1;                 /* an index that may be right as well, once one was wrong */
+    size_t header_errors = 0;             /* when the current header was met */
+    bool header_told = false;             /* it has been told that it stands in a wrong place */
+    bool rest_of_line = false;            /* the current line goes on with the one before */
     int map_line = 0;
     int manager_line = 0;
     cdb_ref_t nobody = {}; /* what refers to the elements of a run that belongs to nothing */

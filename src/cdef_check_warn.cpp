@@ -36,23 +36,32 @@ bool is_numeric(vx_data_type_t type) {
     return scalar >= VX_INT32 && scalar <= VX_FLOAT64;
 }
 
-/* A number as the C library reads it. */
+/* A number as the C library reads it. Plain ones are read without it. */
 struct number {
-    explicit number(std::string_view text, int base) : digits(text) {
+    explicit number(std::string_view given, int base) : text(given) {
+        constexpr size_t SAFE_DIGITS = 18;
+        bool plain = !text.empty() && text.size() <= SAFE_DIGITS && (text[0] != '0' || text.size() == 1 || base == 10);
+        for (; plain && read < text.size() && text[read] >= '0' && text[read] <= '9'; ++read)
+            value = value * 10 + (text[read] - '0');
+        if (read == 0 || read < text.size())
+            convert(base);
+    }
+
+    void convert(int base) {
+        std::string copy(text);
         errno = 0;
         char *stop = nullptr;
-        value = std::strtol(digits.c_str(), &stop, base);
+        value = std::strtol(copy.c_str(), &stop, base);
         overflow = errno == ERANGE;
-        read = static_cast<size_t>(stop - digits.c_str());
+        read = static_cast<size_t>(stop - copy.c_str());
     }
 
     std::string_view rest() const {
-        std::string_view text = digits;
-        text.remove_prefix(read);
-        return text.substr(std::min(text.find_first_not_of(" \t"), text.size()));
+        std::string_view left = text.substr(read);
+        return left.substr(std::min(left.find_first_not_of(" \t"), left.size()));
     }
 
-    std::string digits;
+    std::string_view text;
     long value = 0;
     size_t read = 0;
     bool overflow = false;
@@ -79,13 +88,19 @@ struct pair_of_texts {
 
 } // namespace
 
+std::string_view session::value_text() const {
+    return std::string_view(raw).substr(value_part(0, 0).column - 1, cx.latest.length);
+}
+
 /* ---- Lines ---------------------------------------------------------------------------------------------------- */
 
 void session::watch_line(const source_line &source) {
     bool whole_piece = source.begin == cx.inbuf && raw.size() == PIECE;
     if (seen.piece != 0)
-        warn(LONG_LINE, {seen.piece, 0, 0},
-             "line of more than 254 characters: the rest is read as a line of its own, and later lines count one more");
+        warn_at(
+            LONG_LINE, {seen.piece, 0, 0}, {},
+            "line of more than 254 characters: the rest is read as a line of its own, and later lines count one more");
+    rest_of_line = seen.piece != 0;
     seen.piece = whole_piece ? cx.linenum : 0;
     if (raw.ends_with('\r') && !seen.carriage_returns) {
         seen.carriage_returns = true;
@@ -113,8 +128,8 @@ static name_list unchecked_missing(session &check) {
 void session::watch_stanza_end(int next_kind) {
     if (kind >= 0 && !skipping && !cx.stanzas[index_of(kind)].broken)
         if (name_list names = unchecked_missing(*this); !names.empty())
-            warn(INCOMPLETE, stanzas[index_of(kind)].header,
-                 quoted(sc_tables[index_of(kind)].sc_name) + " lacks " + listed(names));
+            warn_at(INCOMPLETE, stanzas[index_of(kind)].header, stanzas[index_of(kind)].source,
+                    quoted(sc_tables[index_of(kind)].sc_name) + " lacks " + listed(names));
     bool runs_on = next_kind >= 0 && is_attribute_run(next_kind);
     bool reported = seen.sd_attribute.line == 0;
     if (reported || runs_on) {
@@ -122,10 +137,11 @@ void session::watch_stanza_end(int next_kind) {
         return;
     }
     if (!seen.sd_run && out.errors == 0)
-        warn(SD_WITHOUT_RUN, seen.sd_attribute, "attribute of structured data without elements: it has no value");
+        warn_at(SD_WITHOUT_RUN, seen.sd_attribute, seen.sd_source,
+                "attribute of structured data without elements: it has no value");
     if (seen.sd_run && line.line == nullptr && cx.attr_dflt_val != nullptr)
-        warn(SD_RUN_AT_END, seen.sd_attribute,
-             "the elements end the file: the attribute is completed before them and has no value");
+        warn_at(SD_RUN_AT_END, seen.sd_attribute, seen.sd_source,
+                "the elements end the file: the attribute is completed before them and has no value");
     seen.sd_attribute = {};
     seen.sd_run = false;
 }
@@ -133,7 +149,7 @@ void session::watch_stanza_end(int next_kind) {
 void session::watch_header(int new_kind) {
     bool begins_run = is_sd_kind(new_kind) && (cx.cb_sd_def.sd_cb_ID == 0 || kind != new_kind);
     if (begins_run) {
-        seen.known[index_of(new_kind)] = {};
+        seen.known[index_of(new_kind)].names.clear();
         odd_elements.clear();
     }
     if (begins_run && is_action_run(new_kind) && cx.cb_rsrc_action.ac_cb_ID == 0 && cx.cb_rsrc_actionC.ac_cb_ID == 0)
@@ -150,14 +166,17 @@ void session::watch_header(int new_kind) {
                      " unchecked and without its defaults",
                  {{stanzas[index_of(each)].header, "begun here"}});
     }
-    seen.known = {};
+    for (known_values &known : seen.known) {
+        known.names.clear();
+        known.ids.clear();
+    }
 }
 
 /* ---- Attributes ----------------------------------------------------------------------------------------------- */
 
 void session::watch_attribute() {
     const table_attrs &attr = *cx.latest.attr;
-    std::string_view text = std::string_view(raw).substr(value_part(0, 0).column - 1, cx.latest.length);
+    std::string_view text = value_text();
     place at = value_part(0, cx.latest.length);
     watch_quotes();
     watch_numbers();
@@ -167,7 +186,7 @@ void session::watch_attribute() {
     case AT_ID:
         return watch_name();
     case AT_LOCATOR:
-        seen.locator = mention{at, std::string(text)};
+        seen.locator = mention{at, std::string(text), raw};
         return;
     case AT_RANGE:
         return watch_range();
@@ -190,13 +209,14 @@ void session::watch_attribute() {
         stanzas[index_of(kind)].data_type = at;
         if (scalar_vx(data_type(cx)) == VX_SD_PTR) {
             seen.sd_attribute = stanzas[index_of(kind)].header;
+            seen.sd_source = stanzas[index_of(kind)].source;
             seen.sd_run = false;
         }
         return;
     case AT_SD_DATA_TYPE: {
         bool unknown = data_type(cx) == VX_UNKNOWN;
         if (cx.attr_dflt_val != nullptr && (unknown || text == "SBS"))
-            odd_elements.push_back({at, std::string(text)});
+            odd_elements.push_back({at, std::string(text), {}});
         else if (unknown)
             warn(ELEMENT_TYPE, at, "unknown data type: the element gets none",
                  {{at, suggestion(text, data_type_names())}});
@@ -244,12 +264,11 @@ void session::watch_typed(std::string_view text, size_t offset) {
 }
 
 void session::watch_version() {
-    size_t begin = value_part(0, 0).column - 1;
-    std::string text = raw.substr(begin, cx.latest.length);
+    std::string_view text = value_text();
     size_t offset = 0;
     for (int part = 0; part < 4 && offset <= text.size(); ++part) {
         size_t dot = std::min(text.find('.', offset), text.size());
-        std::string piece = text.substr(offset, dot - offset);
+        std::string_view piece = text.substr(offset, dot - offset);
         number n(piece, 10);
         if (!n.rest().empty())
             warn(NUMBER_TEXT, value_part(offset, piece.size()),
@@ -263,7 +282,7 @@ void session::watch_version() {
 }
 
 void session::watch_numbers() {
-    std::string text = raw.substr(value_part(0, 0).column - 1, cx.latest.length);
+    std::string_view text = value_text();
     pair_of_texts both(text);
     switch (cx.latest.attr->ta_type) {
     case AT_UINT16:
@@ -299,7 +318,7 @@ void session::watch_numbers() {
 
 /* Values that fit their type; others have been warned of. */
 void session::watch_bounds() {
-    std::string text = raw.substr(value_part(0, 0).column - 1, cx.latest.length);
+    std::string_view text = value_text();
     pair_of_texts both(text);
     if (!both.two())
         return;
@@ -323,24 +342,28 @@ void session::watch_bounds() {
 /* ---- Names, ranges, quotes ------------------------------------------------------------------------------------ */
 
 void session::watch_name() {
-    std::string text = raw.substr(value_part(0, 0).column - 1, cx.latest.length);
+    std::string_view text = value_text();
     place at = value_part(0, cx.latest.length);
     std::string_view attr = cx.latest.attr->ta_name;
     if (attr == "VariableClass" && kind == SC_RESOURCE_VARIABLE_CLASS)
-        seen.defined_variable_classes.try_emplace(text, cx.linenum);
+        seen.defined_variable_classes.of(text) = cx.linenum;
     if (attr == "VariableClass" && kind != SC_RESOURCE_VARIABLE_CLASS)
-        seen.variable_classes.push_back({at, text});
+        seen.variable_classes.push_back({at, std::string(text), raw});
     known_values &known = seen.known[index_of(kind)];
     if ((attr == "Name" || attr == "ElementName") && kind != SC_RESOURCE_CLASS)
-        if (auto [first, fresh] = known.names.try_emplace(text, cx.linenum); !fresh)
-            warn(SAME_NAME, at, "another " + quoted(sc_tables[index_of(kind)].sc_name) + " has the same name",
-                 {{{first->second, 0, 0}, "first given here"}});
+        watch_first(SAME_NAME, known.names.of(text), at, "name");
     if (attr == "Id") {
-        long id = number(text, 0).value & std::numeric_limits<vx_uint32_t>::max();
-        if (auto [first, fresh] = known.ids.try_emplace(id, cx.linenum); !fresh)
-            warn(SAME_ID, at, "another " + quoted(sc_tables[index_of(kind)].sc_name) + " has the same Id",
-                 {{{first->second, 0, 0}, "first given here"}});
+        auto id = static_cast<vx_uint32_t>(number(text, 0).value);
+        watch_first(SAME_ID, known.ids.of({reinterpret_cast<const char *>(&id), sizeof id}), at, "Id");
     }
+}
+
+void session::watch_first(warning_id id, int &first, const place &at, const char *what) {
+    if (first != 0)
+        warn(id, at, "another " + quoted(sc_tables[index_of(kind)].sc_name) + " has the same " + what,
+             {{{first, 0, 0}, "first given here"}});
+    else
+        first = cx.linenum;
 }
 
 void session::watch_range() {
@@ -351,7 +374,7 @@ void session::watch_range() {
         warn(RANGE_ELSEWHERE, at, "this Range goes to the `DynamicResourceAttribute` that is still open",
              {{stanzas[SC_DYNAMIC_RESOURCE_ATTRIBUTE].header, "begun here"}});
     else
-        seen.ranges.push_back({at, kind, stanzas[index_of(kind)].header.line});
+        seen.ranges.push_back({at, kind, raw});
 }
 
 /* After what may have completed dynamic attributes: the completion of either kind settles all ranges. */
@@ -364,9 +387,9 @@ void session::ranges_settled(bool resource_was_open, bool class_was_open, int ne
     int completed = of_resource ? SC_DYNAMIC_RESOURCE_ATTRIBUTE : SC_DYNAMIC_CLASS_ATTRIBUTE;
     for (const pending_range &range : seen.ranges)
         if (range.kind != completed)
-            warn(RANGE_ELSEWHERE, range.at,
-                 "this Range is lost: a " + quoted(sc_tables[index_of(completed)].sc_name) + " is completed first",
-                 {{stanzas[index_of(completed)].header, "begun here"}});
+            warn_at(RANGE_ELSEWHERE, range.at, range.source,
+                    "this Range is lost: a " + quoted(sc_tables[index_of(completed)].sc_name) + " is completed first",
+                    {{stanzas[index_of(completed)].header, "begun here"}});
     seen.ranges.clear();
 }
 
@@ -374,7 +397,7 @@ void session::watch_quotes() {
     size_t begin = value_part(0, 0).column - 1;
     if (begin == 0 || raw[begin - 1] != '"')
         return;
-    std::string_view text = std::string_view(raw).substr(begin, cx.latest.length);
+    std::string_view text = value_text();
     for (size_t at = text.find('"'); at != std::string_view::npos; at = text.find('"', at + 1))
         if (at == 0 || text[at - 1] != '\\') {
             warn(TEXT_AFTER_QUOTE, value_part(at, text.size() - at),
@@ -389,23 +412,74 @@ void session::watch_quotes() {
 void session::watch_end() {
     if (out.errors > 0)
         return;
-    known_values &attributes = seen.known[SC_PERSISTENT_RESOURCE_ATTRIBUTE];
-    if (seen.locator && attributes.names.find(seen.locator->text) == attributes.names.end()) {
-        name_list names;
-        for (const auto &[name, line_number] : attributes.names)
-            names.emplace_back(name);
-        std::sort(names.begin(), names.end());
-        warn(UNKNOWN_LOCATOR, seen.locator->at, "no `PersistentResourceAttribute` has this name",
-             {{seen.locator->at, suggestion(seen.locator->text, names)}});
-    }
-    name_list names;
-    for (const auto &[name, line_number] : seen.defined_variable_classes)
-        names.emplace_back(name);
-    std::sort(names.begin(), names.end());
+    const first_lines &attributes = seen.known[SC_PERSISTENT_RESOURCE_ATTRIBUTE].names;
+    if (seen.locator && !attributes.has(seen.locator->text))
+        warn_at(UNKNOWN_LOCATOR, seen.locator->at, seen.locator->source,
+                "no `PersistentResourceAttribute` has this name",
+                {{seen.locator->at, suggestion(seen.locator->text, attributes.all())}});
     for (const mention &named : seen.variable_classes)
-        if (seen.defined_variable_classes.find(named.text) == seen.defined_variable_classes.end())
-            warn(UNKNOWN_VARIABLE_CLASS, named.at, "no `ResourceVariableClass` has this name",
-                 {{named.at, suggestion(named.text, names)}});
+        if (!seen.defined_variable_classes.has(named.text))
+            warn_at(UNKNOWN_VARIABLE_CLASS, named.at, named.source, "no `ResourceVariableClass` has this name",
+                    {{named.at, suggestion(named.text, seen.defined_variable_classes.all())}});
+    for (finding &found : out.findings)
+        std::erase_if(found.notes, [](const note &each) { return each.text.empty(); });
+}
+
+/* ---- Texts and their first lines ------------------------------------------------------------------------------ */
+
+size_t first_lines::slot_of(std::string_view text, size_t hash) const {
+    size_t mask = slots.size() - 1;
+    size_t slot = hash & mask;
+    for (; slots[slot] != 0; slot = (slot + 1) & mask) {
+        const entry &each = entries[slots[slot] - 1];
+        if (each.hash == hash && text_of(each) == text)
+            break;
+    }
+    return slot;
+}
+
+void first_lines::grow() {
+    constexpr size_t FEWEST = 64;
+    size_t size = std::max(FEWEST, 2 * slots.size());
+    slots.assign(size, 0);
+    for (size_t i = 0; i < entries.size(); ++i) {
+        size_t slot = entries[i].hash & (size - 1);
+        while (slots[slot] != 0)
+            slot = (slot + 1) & (size - 1);
+        slots[slot] = static_cast<unsigned>(i + 1);
+    }
+}
+
+int &first_lines::of(std::string_view text) {
+    if (2 * entries.size() >= slots.size())
+        grow();
+    size_t hash = std::hash<std::string_view>()(text);
+    unsigned &slot = slots[slot_of(text, hash)];
+    if (slot == 0) {
+        entries.push_back({hash, texts.size(), text.size(), 0});
+        texts += text;
+        slot = static_cast<unsigned>(entries.size());
+    }
+    return entries[slot - 1].line;
+}
+
+bool first_lines::has(std::string_view text) const {
+    return !slots.empty() && slots[slot_of(text, std::hash<std::string_view>()(text))] != 0;
+}
+
+name_list first_lines::all() const {
+    name_list names;
+    for (const entry &each : entries)
+        names.push_back(text_of(each));
+    return names;
+}
+
+void first_lines::clear() {
+    if (entries.empty())
+        return;
+    texts.clear();
+    entries.clear();
+    std::fill(slots.begin(), slots.end(), 0);
 }
 
 } // namespace cdef::check

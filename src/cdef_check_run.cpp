@@ -81,6 +81,7 @@ finding &session::error(const fatal_exit &failure, const place &at) {
                             .source = raw,
                             .notes = {}});
     ++out.errors;
+    error_line = cx.linenum;
     return out.findings.back();
 }
 
@@ -229,6 +230,7 @@ bool session::recover_header(const fatal_exit &failure, int new_kind) {
         int failed = is_sd_kind(cx.completing) ? sd_kind : cx.completing;
         if (!cx.stanzas[index_of(failed)].broken && may_follow(failure))
             add_notes(error(failure, here(mark_kind::none)), failure, failed);
+        splits_stanza = splits_stanza || (failed == kind && out.errors > header_errors);
         abandon(failed, failure);
         return true;
     }
@@ -247,6 +249,7 @@ bool session::recover_header(const fatal_exit &failure, int new_kind) {
     if (no_attribute) {
         finish_run_by_hand(new_kind);
         open_stanza(new_kind, true);
+        stanzas[index_of(new_kind)].misplaced = true;
         index_lost = true;
     } else {
         skip_stanza();
@@ -257,8 +260,7 @@ bool session::recover_header(const fatal_exit &failure, int new_kind) {
 /* A header that names no kind: of an attribute line without its blank, a near miss, or lost. */
 void session::unknown_header(const attr_text &text, const fatal_exit &failure) {
     std::string_view name(text.name, static_cast<size_t>(text.end - text.name));
-    if (rest_of_line && !out.findings.empty() && out.findings.back().error &&
-        out.findings.back().at.line + 1 == cx.linenum)
+    if (rest_of_line && error_line + 1 == cx.linenum)
         return; /* all of the line has been told of */
     finding &found = error(failure, all_of_line());
     if (raw.ends_with('\r')) {
@@ -322,7 +324,7 @@ void session::take_header(const attr_text &text, bool guessed) {
     bool class_open = cx.cb_rsrc_dattrC.ra_cb_ID != 0;
     bool no_index = lost_index(new_kind);
     header_errors = out.errors;
-    header_told = false;
+    header_told = splits_stanza = false;
     for (int tries = 0; tries < HEADER_TRIES; ++tries) {
         auto before = std::tuple(cx.scp, cx.prev_scp, cx.curr_sd_scp, cx.state, cx.table_id);
         cx.completing = -1;
@@ -330,6 +332,7 @@ void session::take_header(const attr_text &text, bool guessed) {
             take_line(cx, text);
             ranges_settled(resource_open, class_open, new_kind);
             open_stanza(new_kind, guessed || header_told);
+            stanzas[index_of(new_kind)].misplaced = splits_stanza;
             index_lost = index_lost || no_index;
             return;
         } catch (const fatal_exit &failure) {
@@ -362,6 +365,10 @@ bool session::misplaced(const fatal_exit &failure) {
     bool &before = stanzas[index_of(kind)].misplaced;
     if (before)
         return unknown || repeated || is_message(known, "S208");
+    if (unknown && cx.prev_scp != nullptr) { /* what is missed there is perhaps here */
+        stanza_state &previous = cx.stanzas[static_cast<size_t>(cx.prev_scp - sc_tables.data())];
+        previous.broken = previous.broken || previous.req_mask != cx.prev_scp->req_mask_cmplt;
+    }
     before = unknown || (repeated && cx.latest.attr == &sc_tables[index_of(kind)].sc_attrs[0]);
     return false;
 }

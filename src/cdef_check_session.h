@@ -63,7 +63,11 @@ private:
 
     std::string texts;
     std::vector<entry> entries;
-    std::vector<unsigned> slots; /* positions in entries, from 1; 0 is free */
+    struct slot {
+        unsigned tag;      /* of the hash: most others are passed over without a look at the entry */
+        unsigned position; /* in entries, from 1; 0 is free */
+    };
+    std::vector<slot> slots;
 };
 
 /* Names and numbers of one kind. */
@@ -136,6 +140,7 @@ struct session {
     void watch_numbers();
     void watch_typed(std::string_view text, size_t offset);
     void watch_bounds();
+    void watch_valid(std::string_view text);
     void watch_version();
     void watch_name();
     void watch_first(warning_id id, int &first, const place &at, const char *what);
@@ -164,6 +169,8 @@ struct session {
     int other_index = -1;                 /* an index that may be right as well, once one was wrong */
     size_t header_errors = 0;             /* when the current header was met */
     bool header_told = false;             /* it has been told that it stands in a wrong place */
+    bool splits_stanza = false;           /* the stanza in front of it is incomplete */
+    int error_line = 0;                   /* of the latest error */
     bool rest_of_line = false;            /* the current line goes on with the one before */
     int map_line = 0;
     int manager_line = 0;

@@ -283,7 +283,6 @@ void session::watch_version() {
 
 void session::watch_numbers() {
     std::string_view text = value_text();
-    pair_of_texts both(text);
     switch (cx.latest.attr->ta_type) {
     case AT_UINT16:
     case AT_SD_DESCRIPTION:
@@ -293,10 +292,12 @@ void session::watch_numbers() {
         return watch_number(text, 0, 16);
     case AT_ID:
         return watch_number(text, 0, 32);
-    case AT_VARIETY:
+    case AT_VARIETY: {
+        pair_of_texts both(text);
         watch_number(both.low, 0, 32);
         watch_number(both.high, both.offset, 32);
         return watch_bounds();
+    }
     case AT_VERSION:
         return watch_version();
     case AT_DEFAULT_VALUE:
@@ -305,15 +306,21 @@ void session::watch_numbers() {
     case AT_VALID_VALUE:
     case AT_SD_VALID_VALUE:
     case AT_RANGE:
-        if (!is_numeric(data_type(cx)))
-            return;
-        watch_typed(both.low, 0);
-        if (both.two())
-            watch_typed(both.high, both.offset);
-        return watch_bounds();
+        return watch_valid(text);
     default:
         return;
     }
+}
+
+void session::watch_valid(std::string_view text) {
+    if (!is_numeric(data_type(cx)))
+        return;
+    pair_of_texts both(text);
+    watch_typed(both.low, 0);
+    if (!both.two())
+        return;
+    watch_typed(both.high, both.offset);
+    watch_bounds();
 }
 
 /* Values that fit their type; others have been warned of. */
@@ -427,26 +434,28 @@ void session::watch_end() {
 
 /* ---- Texts and their first lines ------------------------------------------------------------------------------ */
 
+static unsigned tag_of(size_t hash) {
+    return static_cast<unsigned>(hash >> 32);
+}
+
 size_t first_lines::slot_of(std::string_view text, size_t hash) const {
     size_t mask = slots.size() - 1;
-    size_t slot = hash & mask;
-    for (; slots[slot] != 0; slot = (slot + 1) & mask) {
-        const entry &each = entries[slots[slot] - 1];
-        if (each.hash == hash && text_of(each) == text)
+    size_t at = hash & mask;
+    for (; slots[at].position != 0; at = (at + 1) & mask)
+        if (slots[at].tag == tag_of(hash) && text_of(entries[slots[at].position - 1]) == text)
             break;
-    }
-    return slot;
+    return at;
 }
 
 void first_lines::grow() {
     constexpr size_t FEWEST = 64;
     size_t size = std::max(FEWEST, 2 * slots.size());
-    slots.assign(size, 0);
+    slots.assign(size, {0, 0});
     for (size_t i = 0; i < entries.size(); ++i) {
-        size_t slot = entries[i].hash & (size - 1);
-        while (slots[slot] != 0)
-            slot = (slot + 1) & (size - 1);
-        slots[slot] = static_cast<unsigned>(i + 1);
+        size_t at = entries[i].hash & (size - 1);
+        while (slots[at].position != 0)
+            at = (at + 1) & (size - 1);
+        slots[at] = {tag_of(entries[i].hash), static_cast<unsigned>(i + 1)};
     }
 }
 
@@ -454,17 +463,17 @@ int &first_lines::of(std::string_view text) {
     if (2 * entries.size() >= slots.size())
         grow();
     size_t hash = std::hash<std::string_view>()(text);
-    unsigned &slot = slots[slot_of(text, hash)];
-    if (slot == 0) {
+    slot &found = slots[slot_of(text, hash)];
+    if (found.position == 0) {
         entries.push_back({hash, texts.size(), text.size(), 0});
         texts += text;
-        slot = static_cast<unsigned>(entries.size());
+        found = {tag_of(hash), static_cast<unsigned>(entries.size())};
     }
-    return entries[slot - 1].line;
+    return entries[found.position - 1].line;
 }
 
 bool first_lines::has(std::string_view text) const {
-    return !slots.empty() && slots[slot_of(text, std::hash<std::string_view>()(text))] != 0;
+    return !slots.empty() && slots[slot_of(text, std::hash<std::string_view>()(text))].position != 0;
 }
 
 name_list first_lines::all() const {
@@ -479,7 +488,7 @@ void first_lines::clear() {
         return;
     texts.clear();
     entries.clear();
-    std::fill(slots.begin(), slots.end(), 0);
+    std::fill(slots.begin(), slots.end(), slot{0, 0});
 }
 
 } // namespace cdef::check

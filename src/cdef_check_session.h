@@ -41,7 +41,13 @@ struct pending_range {
 class first_lines {
 public:
     /* The line for a text, which is 0 if it is a new one. */
-    int &of(std::string_view text);
+    int &of(std::string_view text) {
+        return of(text, std::hash<std::string_view>()(text));
+    }
+    /* A number, whose hash is itself: they mostly ascend, and so stay close together. */
+    int &of(vx_uint32_t number) {
+        return of({reinterpret_cast<const char *>(&number), sizeof number}, number | size_t{number} << 32);
+    }
     bool has(std::string_view text) const;
     /* All texts; they stay as long as none is added. */
     name_list all() const;
@@ -55,6 +61,7 @@ private:
         int line;
     };
 
+    int &of(std::string_view text, size_t hash);
     size_t slot_of(std::string_view text, size_t hash) const;
     void grow();
     std::string_view text_of(const entry &each) const {

@@ -361,7 +361,7 @@ void session::watch_name() {
         watch_first(SAME_NAME, known.names.of(text), at, "name");
     if (attr == "Id") {
         auto id = static_cast<vx_uint32_t>(number(text, 0).value);
-        watch_first(SAME_ID, known.ids.of({reinterpret_cast<const char *>(&id), sizeof id}), at, "Id");
+        watch_first(SAME_ID, known.ids.of(id), at, "Id");
     }
 }
 
@@ -459,10 +459,9 @@ void first_lines::grow() {
     }
 }
 
-int &first_lines::of(std::string_view text) {
+int &first_lines::of(std::string_view text, size_t hash) {
     if (2 * entries.size() >= slots.size())
         grow();
-    size_t hash = std::hash<std::string_view>()(text);
     slot &found = slots[slot_of(text, hash)];
     if (found.position == 0) {
         entries.push_back({hash, texts.size(), text.size(), 0});

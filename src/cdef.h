@@ -1,5 +1,5 @@
 /* cdef.h: what the inspector's subcommands share. Each one is a file, cdef_<name>.cpp; it knows the reader and nothing
- * of the compiler. */
+ * of the compiler; but for cdef_check*, which drives the compiler over sources. */
 #ifndef CDGEN_CDEF_H
 #define CDGEN_CDEF_H
 
@@ -53,6 +53,7 @@ bool wants_colour();
 
 /* Each adds its subcommand to the program. When it runs, it sets status. */
 void add_verify(CLI::App &app, int &status);
+void add_check(CLI::App &app, int &status);
 
 } // namespace cdef
 

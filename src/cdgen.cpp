@@ -44,21 +44,13 @@ void parse_command_line(cdgen &cx, int argc, char **argv) {
     cx.cdefname = argv[optind];
 }
 
-/* At the end of input, in this order. Deliberate: attributes and actions come before the SD run that may belong to
- * them. */
-void complete_open_records(cdgen &cx) {
-    if (cx.cb_rsrc_pattr.ra_cb_ID != 0)
-        cmplt_pattr_tbl(cx);
-    if (cx.cb_rsrc_dattr.ra_cb_ID != 0)
-        cmplt_dattr_tbl(cx);
-    if (cx.cb_rsrc_pattrC.ra_cb_ID != 0)
-        cmplt_pattrC_tbl(cx);
-    if (cx.cb_rsrc_dattrC.ra_cb_ID != 0)
-        cmplt_dattrC_tbl(cx);
-    if (cx.cb_rsrc_action.ac_cb_ID != 0)
-        cmplt_action_tbl(cx);
-    if (cx.cb_rsrc_actionC.ac_cb_ID != 0)
-        cmplt_actionC_tbl(cx);
+/* Completes a record if it is open. */
+template <auto Record, auto Identifier, void (*Complete)(cdgen &)> void complete_open(cdgen &cx) {
+    if ((cx.*Record).*Identifier != 0)
+        Complete(cx);
+}
+
+void complete_sd_run(cdgen &cx) {
     if (cx.cb_sd_def.sd_cb_ID != 0)
         cmplt_sd_tbl(cx, cx.curr_sd_scp);
 }
@@ -97,17 +89,35 @@ void make_manager(cdgen &cx) {
     cmplt_mgr_tbl(cx);
 }
 
-void complete_top_level(cdgen &cx) {
+void complete_class(cdgen &cx) {
     if (cx.cb_rsrc_class.rc_cb_ID == 0)
         cdgen_error_exit(cx, "No classes defined", nullptr, nullptr, 0, 1);
     cmplt_class_tbl(cx);
-    if (cx.cb_rsrc_variable_class.rvc_cb_ID != 0)
-        cmplt_var_class_tbl(cx);
+}
+
+void complete_map(cdgen &cx) {
     if (cx.cb_rsrc_cmmap.rcm_cb_ID == 0)
         cdgen_error_exit(cx, "No class-to-manager maps defined", nullptr, nullptr, 0, 1);
     cmplt_cmmap_tbl(cx);
-    make_manager(cx);
 }
+
+/* Deliberate: attributes and actions come before the SD run that may belong to them. */
+constexpr closing_step steps[] = {
+    complete_open<&cdgen::cb_rsrc_pattr, &rsrc_pattr_t::ra_cb_ID, cmplt_pattr_tbl>,
+    complete_open<&cdgen::cb_rsrc_dattr, &rsrc_dattr_t::ra_cb_ID, cmplt_dattr_tbl>,
+    complete_open<&cdgen::cb_rsrc_pattrC, &rsrc_pattr_t::ra_cb_ID, cmplt_pattrC_tbl>,
+    complete_open<&cdgen::cb_rsrc_dattrC, &rsrc_dattr_t::ra_cb_ID, cmplt_dattrC_tbl>,
+    complete_open<&cdgen::cb_rsrc_action, &rsrc_action_t::ac_cb_ID, cmplt_action_tbl>,
+    complete_open<&cdgen::cb_rsrc_actionC, &rsrc_action_t::ac_cb_ID, cmplt_actionC_tbl>,
+    complete_sd_run,
+    resolve_locator,
+    complete_class,
+    complete_open<&cdgen::cb_rsrc_variable_class, &rsrc_variable_class_t::rvc_cb_ID, cmplt_var_class_tbl>,
+    complete_map,
+    make_manager,
+    drop_values,
+    bld_var_id_tbls,
+};
 
 const char *text_or_none(const char *text) {
     return text == nullptr ? "" : text;
@@ -136,12 +146,15 @@ void take_errors_from_calls() {
 
 } // namespace
 
+constinit const std::span<const closing_step> closing_steps = steps;
+
 cdgen::~cdgen() {
     discard_mapfile(*this);
 }
 
 void cdgen_error_exit(cdgen &cx, const char *msg, const char *detail1, const char *detail2, int line, int code) {
-    cx.cdb_fp.close();
+    if (!cx.checking)
+        cx.cdb_fp.close();
     discard_mapfile(cx);
     throw fatal_exit{msg, detail1, detail2, line, code};
 }
@@ -152,11 +165,8 @@ void source_error(cdgen &cx, const char *msg, const char *detail1, const char *d
 
 void compile(cdgen &cx) {
     cache_input_data(cx, cx.cdefsrc);
-    complete_open_records(cx);
-    resolve_locator(cx);
-    complete_top_level(cx);
-    drop_values(cx);
-    bld_var_id_tbls(cx);
+    for (closing_step step : closing_steps)
+        step(cx);
     bld_cdb(cx);
 }
 

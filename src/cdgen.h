@@ -358,6 +358,7 @@ struct stanza_state {
     vx_uint32_t req_mask = 0; /* required attributes seen */
     vx_uint32_t opt_mask = 0; /* optional attributes seen, with their OPTIONAL bit */
     dflt_tbl dflt;
+    bool broken = false; /* has been reported: nothing is missed in it any more. A check of sources says so */
 };
 
 /* ---- The compilation ------------------------------------------------------------------------------------------- */
@@ -424,6 +425,13 @@ struct free_memory {
     }
 };
 
+/* What an attribute line says, once its name is known. The value is taken apart later. */
+struct attr_place {
+    const table_attrs *attr = nullptr;
+    const char *value = nullptr;
+    size_t length = 0;
+};
+
 /* All state of one compilation. A staging record is open while its first word, the cb_ID, is not 0. */
 struct cdgen {
     cdgen() = default;
@@ -437,6 +445,11 @@ struct cdgen {
     int swap_endianness = 0;
     const char *cdefsrc = nullptr;
     const char *cdefname = nullptr;
+
+    /* For a check of sources, which catches what ends a compilation and goes on with the next line. */
+    bool checking = false; /* an error leaves the source open, and nothing is printed */
+    int completing = -1;   /* stanza_id of the completion that has begun and not ended; one for all structured data */
+    attr_place latest;     /* of the latest attribute line */
 
     /* errno as far as number conversions see it: they alone set it, nothing clears it. So an overflow makes a later 0
      * or limit value fail, as it always did, and nothing else does. */
@@ -544,6 +557,9 @@ int cdgen_main(int argc, char **argv);
 void compile(cdgen &cx);
 
 void cache_input_data(cdgen &cx, const char *filename);
+/* What the end of input asks for, up to the sizing of the image, in this order. */
+using closing_step = void (*)(cdgen &);
+extern const std::span<const closing_step> closing_steps;
 /* il: an attribute line without comment and newline, taken apart in place. */
 void save_attr(cdgen &cx, char *il, int table_id);
 
@@ -588,8 +604,10 @@ tbl *find_tbl_entry(cdgen &cx, const rsrc_variable_class_t *rvcp);
 void add_tbl_entry(cdgen &cx, const rsrc_variable_class_t *rvcp, tbl *entry_ptr);
 void del_tbl_entry(cdgen &cx, const rsrc_variable_class_t *rvcp);
 
-/* The image. cdb_size also stores counts and sizes into the staged class records. */
+/* The image. cdb_size also stores counts and sizes into the staged class records; fit_image counts the sections first,
+ * and so finds all that can be wrong with an image before there is a file. */
 void bld_cdb(cdgen &cx);
+size_t fit_image(cdgen &cx);
 size_t cdb_size(cdgen &cx);
 /* The checksum of an image: a start value, XORed with the (length - 4) / 4 words from the format word on. */
 vx_uint32_t cdb_checksum(const char *image, vx_uint32_t start, vx_uint32_t length);

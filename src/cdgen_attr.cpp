@@ -47,7 +47,7 @@ const table_attrs &known_attr(cdgen &cx, const srtable_ctrl &scp, std::string_vi
 
 /* Optional attributes follow the required ones; most may stand once. */
 void count_optional(cdgen &cx, const srtable_ctrl &scp, stanza_state &state, const table_attrs &attr) {
-    if (state.req_mask != scp.req_mask_cmplt)
+    if (state.req_mask != scp.req_mask_cmplt && !state.broken)
         source_error(cx, "Optional attribute discovered before all required attributes have been defined",
                      attr.ta_name);
     if ((state.opt_mask & attr.req_bit & ~OPTIONAL) != 0 && !attr.dup_allowed)
@@ -76,8 +76,10 @@ void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, s
     if (value == nullptr)
         return;
     const table_attrs &attr = known_attr(cx, scp, name);
+    cx.latest = {&attr, value, length};
     if (*value == '\0') {
-        printf("In file %s: ", cx.cdefsrc);
+        if (!cx.checking)
+            printf("In file %s: ", cx.cdefsrc);
         source_error(cx, "Missing attribute value: ", attr.ta_name);
     }
     if (cx.debugLevel >= 2)

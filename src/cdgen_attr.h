@@ -15,7 +15,7 @@ struct attr_line {
     size_t length = strlen(value);
 };
 
-/* An attribute line of which is known where its name begins, behind the blanks, and where it ends, with a NUL. */
+/* A line of which is known where its text begins, behind the blanks, and where it ends, with a NUL. */
 struct attr_text {
     char *line;
     char *name;

@@ -390,9 +390,13 @@ void add_rsrc_var_class_tbls(cdgen &cx) {
     add_all<rsrc_variable_class_t>(cx, &cx.rsrc_var_class_tbl, "No Rsrc Variable Class tables", add_var_class);
 }
 
-void bld_cdb(cdgen &cx) {
+size_t fit_image(cdgen &cx) {
     cx.dsect_count = cx.rsrc_cmmap_count + cx.rsrc_mgr_count + cx.rsrc_var_class_count + cx.rsrc_class_count;
-    cx.chp = get_mapfile(cx, cdb_size(cx));
+    return cdb_size(cx);
+}
+
+void bld_cdb(cdgen &cx) {
+    cx.chp = get_mapfile(cx, fit_image(cx));
     cx.dsect_anchs = cx.chp + sizeof(orb_cdb_header_t);
     cx.dsect_idx = 0;
     cx.dsp = cx.dsect_anchs + sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.dsect_count);

@@ -24,12 +24,14 @@ constexpr const char *NO_CLASS = "No class for class action"; /* deliberately fo
 
 void complete_action(cdgen &cx, const action_kind &kind) {
     rsrc_action_t &action = cx.*kind.record;
+    cx.completing = kind.id;
     require_class(cx, NO_CLASS);
     require_complete(cx, kind.id);
     if (!was_given(cx.stanzas[kind.id], PERMISSION_BIT))
         action.ac_perms = DEFAULT_PERMISSION;
     append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), action);
     action.ac_cb_ID = 0;
+    cx.completing = -1;
 }
 
 void start_action(cdgen &cx, const action_kind &kind) {

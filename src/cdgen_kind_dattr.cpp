@@ -96,7 +96,7 @@ void open_dattr(cdgen &cx, const dattr_kind &kind) {
 }
 
 void show_masks(cdgen &cx, stanza_id id) {
-    if (cx.stanzas[id].req_mask == sc_tables[id].req_mask_cmplt)
+    if (cx.checking || cx.stanzas[id].req_mask == sc_tables[id].req_mask_cmplt)
         return;
     printf("scp->req_mask:         %x\n", cx.stanzas[id].req_mask);
     printf("scp->req_mask_cmplt:   %x\n", sc_tables[id].req_mask_cmplt);
@@ -104,6 +104,7 @@ void show_masks(cdgen &cx, stanza_id id) {
 
 void complete_dattr(cdgen &cx, const dattr_kind &kind) {
     rsrc_dattr_t &attr = cx.*kind.record;
+    cx.completing = kind.id;
     require_class(cx, NO_CLASS);
     if (kind.shows_masks)
         show_masks(cx, kind.id);
@@ -115,6 +116,7 @@ void complete_dattr(cdgen &cx, const dattr_kind &kind) {
     note_stray_range(cx, attr, kind.records);
     append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), attr);
     attr.ra_cb_ID = 0;
+    cx.completing = -1;
 }
 
 void start_dattr(cdgen &cx, const dattr_kind &kind) {

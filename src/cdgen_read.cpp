@@ -1,6 +1,6 @@
 /* cdgen_read.cpp: reads the source line by line, removes comments, and frames stanzas. */
 
-#include "cdgen_attr.h"
+#include "cdgen_read.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -12,16 +12,6 @@
 namespace {
 
 constexpr size_t LINE_MAX_CHARS = 254; /* taken by one read, the newline included */
-
-void open_source(cdgen &cx, const char *filename) {
-    source_file &source = cx.cdb_fp;
-    source.fd = above_stdio(open(filename, O_RDONLY | O_CLOEXEC));
-    struct stat st = {};
-    if (source.fd < 0 || fstat(source.fd, &st) != 0)
-        cdgen_error_exit(cx, filename, ": cannot open because: ", strerror(errno), 0, errno);
-    source.device = st.st_dev;
-    source.inode = st.st_ino;
-}
 
 /* What may end a line's text before its newline: quotes and comments, and the NUL behind the last byte. They are rare.
  * Where the next one stands is found once, however many lines stand before it. */
@@ -49,13 +39,6 @@ bool refill(cdgen &cx) {
     return n > 0;
 }
 
-/* A line where it stands: the place of its newline is its end. What has none is copied to where it may be cut. */
-struct source_line {
-    char *begin; /* null: there is no more */
-    char *end;
-    char *&mark; /* the first mark from begin on; at or behind end if the line has none */
-};
-
 source_line whole_line(source_file &source, char *begin, char *newline) {
     source.pos += static_cast<size_t>(newline - begin) + 1;
     if (source.mark < begin)
@@ -71,8 +54,7 @@ source_line cut_line(cdgen &cx, const char *begin, size_t length) {
     return {cx.inbuf, cx.inbuf + length, cx.cdb_fp.cut_mark};
 }
 
-/* The next line, or the next 254 characters of a longer one. */
-source_line next_line(cdgen &cx) {
+source_line some_line(cdgen &cx) {
     source_file &source = cx.cdb_fp;
     for (;;) {
         char *begin = source.buffer.data() + source.pos;
@@ -108,25 +90,6 @@ char *end_by_marks(const source_line &line, char *p) {
         quoted = quoted != (*mark == '"');
         text_seen = text_seen || (*mark == '/' && !comment);
     }
-}
-
-/* A line's text: what is left without comment, and without blanks and hash signs at the end, even quoted ones. */
-struct line_text {
-    char *begin; /* behind the blanks at the line's beginning */
-    char *end;   /* null for a line without text; else a NUL stands there */
-};
-
-line_text text_of(const source_line &line) {
-    char *begin = line.begin;
-    while (is_blank(*begin))
-        ++begin;
-    char *end = line.mark < line.end ? end_by_marks(line, begin) : begin < line.end ? line.end : nullptr;
-    if (end == nullptr)
-        return {};
-    while (is_blank(end[-1]) || end[-1] == '#') /* there is text in front */
-        --end;
-    *end = '\0';
-    return {begin, end};
 }
 
 bool class_is_open(const cdgen &cx) {
@@ -240,24 +203,55 @@ int above_stdio(int fd) {
     return higher;
 }
 
+void open_source(cdgen &cx, const char *filename) {
+    source_file &source = cx.cdb_fp;
+    source.fd = above_stdio(open(filename, O_RDONLY | O_CLOEXEC));
+    struct stat st = {};
+    if (source.fd < 0 || fstat(source.fd, &st) != 0)
+        cdgen_error_exit(cx, filename, ": cannot open because: ", strerror(errno), 0, errno);
+    source.device = st.st_dev;
+    source.inode = st.st_ino;
+    cx.table_id = -1;
+}
+
+source_line next_line(cdgen &cx) {
+    source_line line = some_line(cx);
+    if (line.begin != nullptr && cx.linenum < std::numeric_limits<int>::max())
+        ++cx.linenum;
+    return line;
+}
+
+attr_text text_of(const source_line &line) {
+    char *begin = line.begin;
+    while (is_blank(*begin))
+        ++begin;
+    char *end = line.mark < line.end ? end_by_marks(line, begin) : begin < line.end ? line.end : nullptr;
+    if (end == nullptr)
+        return {line.begin, begin, nullptr};
+    while (is_blank(end[-1]) || end[-1] == '#') /* there is text in front */
+        --end;
+    *end = '\0';
+    return {line.begin, begin, end};
+}
+
+void take_line(cdgen &cx, const attr_text &text) {
+    if (text.name == text.line)
+        begin_stanza(cx, text.name);
+    else if (cx.table_id < 0)
+        source_error(cx, "Attribute found but no table defined yet");
+    else
+        save_attr_line(cx, text, *cx.scp, *cx.state);
+}
+
 void cache_input_data(cdgen &cx, const char *filename) {
     open_source(cx, filename);
-    cx.table_id = -1;
     for (;;) {
         source_line line = next_line(cx);
         if (line.begin == nullptr)
             break;
-        if (cx.linenum < std::numeric_limits<int>::max())
-            ++cx.linenum;
-        auto [begin, end] = text_of(line);
-        if (end == nullptr)
-            continue;
-        if (begin == line.begin)
-            begin_stanza(cx, begin);
-        else if (cx.table_id < 0)
-            source_error(cx, "Attribute found but no table defined yet");
-        else
-            save_attr_line(cx, {line.begin, begin, end}, *cx.scp, *cx.state);
+        attr_text text = text_of(line);
+        if (text.end != nullptr)
+            take_line(cx, text);
     }
     cx.cdb_fp.close();
 }

@@ -1,0 +1,92 @@
+/* cdef_check.cpp: all that is wrong with sources, and what is odd in them. */
+
+#include "cdef_check.h"
+
+#include "cdef.h"
+
+#include <CLI/CLI.hpp>
+
+#include <algorithm>
+#include <memory>
+
+namespace cdef {
+
+namespace {
+
+using check::warning;
+
+struct check_options {
+    std::vector<std::string> sources;
+    std::string format = "text";
+    std::vector<std::string> wanted;
+    std::vector<std::string> unwanted;
+    bool warnings_count = false; /* as errors do */
+};
+
+std::vector<std::string> warning_names() {
+    std::vector<std::string> names = {"all"};
+    for (const warning &known : check::warnings)
+        names.emplace_back(known.name);
+    return names;
+}
+
+void switch_warnings(check::warning_set &set, const std::vector<std::string> &names, bool on) {
+    for (const std::string &name : names)
+        for (const warning &known : check::warnings)
+            if (name == "all" || name == known.name)
+                set[known.id] = on;
+}
+
+/* All but those that are not wanted; and what is named both ways is wanted. */
+check::warning_set chosen(const check_options &options) {
+    check::warning_set set;
+    set.fill(true);
+    switch_warnings(set, options.unwanted, false);
+    switch_warnings(set, options.wanted, true);
+    return set;
+}
+
+void show(const std::vector<check::result> &results, const std::string &format) {
+    if (format == "json")
+        return print(check::as_json(results));
+    if (format == "sarif")
+        return print(check::as_sarif(results));
+    for (const check::result &each : results) {
+        std::string text = check::as_text(each);
+        if (std::fwrite(text.data(), 1, text.size(), stderr) != text.size())
+            throw trouble("standard error: cannot write");
+    }
+}
+
+int check_all(const check_options &options) {
+    std::vector<check::result> results;
+    bool pass = true;
+    for (const std::string &source : options.sources) {
+        results.push_back(check::check_source(source, chosen(options)));
+        pass = pass && results.back().errors == 0 && (results.back().warnings == 0 || !options.warnings_count);
+    }
+    show(results, options.format);
+    return pass ? OK : FOUND;
+}
+
+} // namespace
+
+void add_check(CLI::App &app, int &status) {
+    auto options = std::make_shared<check_options>();
+    CLI::App *command = app.add_subcommand("check", "Checks sources, and goes on behind each mistake");
+    command->add_option("SOURCE", options->sources, "Sources; - is standard input")->required();
+    command->add_option("--format", options->format, "text, json or sarif")
+        ->check(CLI::IsMember({"text", "json", "sarif"}));
+    command->add_option("--warn", options->wanted, "Warns of NAME, or of all")
+        ->type_name("NAME")
+        ->allow_extra_args(false)
+        ->check(CLI::IsMember(warning_names()));
+    command->add_option("--no-warn", options->unwanted, "Does not warn of NAME, or of all")
+        ->type_name("NAME")
+        ->allow_extra_args(false)
+        ->check(CLI::IsMember(warning_names()));
+    command->add_flag("--werror", options->warnings_count, "Warnings count as errors");
+    command->callback([options, &status] { status = check_all(*options); });
+}
+
+} // namespace cdef

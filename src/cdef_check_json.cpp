@@ -1,0 +1,142 @@
+/* cdef_check_json.cpp: findings for programs: JSON of our own, and SARIF 2.1.0. */
+
+#include "cdef_check.h"
+
+#include <nlohmann/json.hpp>
+
+#include <algorithm>
+#include <cctype>
+
+namespace cdef::check {
+
+namespace {
+
+using json = nlohmann::ordered_json;
+
+/* Bytes that are no UTF-8 are replaced. */
+std::string dump(const json &data) {
+    return data.dump(2, ' ', false, json::error_handler_t::replace) + "\n";
+}
+
+const char *level_of(const finding &found) {
+    return found.error ? "error" : "warning";
+}
+
+json number_or_null(size_t number) {
+    return number == 0 ? json() : json(number);
+}
+
+void add_place(json &to, const place &at) {
+    to["line"] = number_or_null(static_cast<size_t>(at.line));
+    to["column"] = number_or_null(at.column);
+    to["length"] = at.column == 0 ? json() : json(at.length);
+}
+
+json json_of(const finding &found) {
+    json data = {{"code", found.code}, {"severity", level_of(found)}, {"name", found.name}, {"message", found.text}};
+    add_place(data, found.at);
+    data["source"] = found.source;
+    data["notes"] = json::array();
+    for (const note &more : found.notes) {
+        json entry = {{"message", more.text}};
+        add_place(entry, more.at);
+        data["notes"].push_back(std::move(entry));
+    }
+    return data;
+}
+
+} // namespace
+
+std::string as_json(std::span<const result> checked) {
+    json all = json::array();
+    for (const result &each : checked) {
+        json findings = json::array();
+        for (const finding &found : each.findings)
+            findings.push_back(json_of(found));
+        all.push_back({{"file", each.file},
+                       {"errors", each.errors},
+                       {"warnings", each.warnings},
+                       {"findings", std::move(findings)}});
+    }
+    return dump(all);
+}
+
+namespace {
+
+/* ---- SARIF ---------------------------------------------------------------------------------------------------- */
+
+/* What may not stand in a URI reference as it is. */
+std::string uri_of(const std::string &file) {
+    constexpr const char *hexadecimal = "0123456789ABCDEF";
+    std::string uri;
+    for (char c : file) {
+        auto byte = static_cast<unsigned char>(c);
+        bool plain = std::isalnum(byte) != 0 || std::string_view("-._~/").find(c) != std::string_view::npos;
+        if (plain)
+            uri += c;
+        else
+            uri += {'%', hexadecimal[byte >> 4], hexadecimal[byte & 15]};
+    }
+    return uri;
+}
+
+/* Characters among the first bytes of a line. */
+size_t characters(std::string_view source, size_t bytes) {
+    auto text = source.substr(0, bytes);
+    return static_cast<size_t>(
+        std::count_if(text.begin(), text.end(), [](char c) { return (static_cast<unsigned char>(c) & 0xC0) != 0x80; }));
+}
+
+json region_of(const place &at, std::string_view source) {
+    json region = {{"startLine", at.line}};
+    if (at.column == 0)
+        return region;
+    region["startColumn"] = source.empty() ? at.column : characters(source, at.column - 1) + 1;
+    region["endColumn"] = source.empty() ? at.column + at.length : characters(source, at.column - 1 + at.length) + 1;
+    return region;
+}
+
+json location_of(const std::string &file, const place &at, std::string_view source) {
+    json physical = {{"artifactLocation", {{"uri", uri_of(file)}}}};
+    if (at.line != 0)
+        physical["region"] = region_of(at, source);
+    return {{"physicalLocation", std::move(physical)}};
+}
+
+json sarif_of(const std::string &file, const finding &found) {
+    json entry = {{"ruleId", found.code}, {"level", level_of(found)}, {"message", {{"text", found.text}}}};
+    entry["locations"] = json::array({location_of(file, found.at, found.source)});
+    for (const note &more : found.notes) {
+        json related = location_of(file, more.at, more.at.line == found.at.line ? found.source : "");
+        related["message"] = {{"text", more.text}};
+        entry["relatedLocations"].push_back(std::move(related));
+    }
+    return entry;
+}
+
+json rules() {
+    json all = json::array();
+    for (const message &known : messages)
+        all.push_back({{"id", known.code}, {"shortDescription", {{"text", known.text}}}});
+    for (const warning &known : warnings)
+        all.push_back({{"id", known.code}, {"name", known.name}, {"shortDescription", {{"text", known.title}}}});
+    return all;
+}
+
+} // namespace
+
+std::string as_sarif(std::span<const result> checked) {
+    json results = json::array();
+    for (const result &each : checked)
+        for (const finding &found : each.findings)
+            results.push_back(sarif_of(each.file, found));
+    json driver = {{"name", "cdef check"}, {"version", CDGEN_VERSION}, {"rules", rules()}};
+    json run = {{"tool", {{"driver", std::move(driver)}}},
+                {"columnKind", "unicodeCodePoints"},
+                {"results", std::move(results)}};
+    return dump({{"$schema", "https://json.schemastore.org/sarif-2.1.0.json"},
+                 {"version", "2.1.0"},
+                 {"runs", json::array({std::move(run)})}});
+}
+
+} // namespace cdef::check

@@ -1,0 +1,127 @@
+/* cdef_check_names.cpp: the names that a source may use, and which of them somebody may have meant. */
+
+#include "cdef_check.h"
+
+#include <algorithm>
+#include <cctype>
+#include <utility>
+
+namespace cdef::check {
+
+namespace {
+
+char lower(char c) {
+    return static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+}
+
+/* How many letters are to be added, dropped, replaced or exchanged with their neighbour; case does not count. */
+size_t distance(std::string_view a, std::string_view b) {
+    std::vector<size_t> before, above, row(b.size() + 1);
+    for (size_t j = 0; j <= b.size(); ++j)
+        row[j] = j;
+    for (size_t i = 1; i <= a.size(); ++i) {
+        before = std::exchange(above, row);
+        row[0] = i;
+        for (size_t j = 1; j <= b.size(); ++j) {
+            bool same = lower(a[i - 1]) == lower(b[j - 1]);
+            row[j] = std::min({above[j] + 1, row[j - 1] + 1, above[j - 1] + (same ? 0 : 1)});
+            if (i > 1 && j > 1 && lower(a[i - 1]) == lower(b[j - 2]) && lower(a[i - 2]) == lower(b[j - 1]))
+                row[j] = std::min(row[j], before[j - 2] + 1);
+        }
+    }
+    return row[b.size()];
+}
+
+constexpr size_t LONGEST_NAME = 64; /* beyond it nothing is like a name */
+
+template <class Properties> name_list names_of(const Properties &properties) {
+    name_list names;
+    for (const props_t &property : properties)
+        names.emplace_back(property.s);
+    return names;
+}
+
+} // namespace
+
+std::string_view near_miss(std::string_view text, const name_list &names) {
+    if (text.size() > LONGEST_NAME)
+        return {};
+    std::string_view best;
+    size_t least = std::clamp<size_t>(text.size() / 3, 1, 3) + 1;
+    for (std::string_view name : names) {
+        size_t far = distance(text, name);
+        if (far < least) {
+            least = far;
+            best = name;
+        } else if (far == least && name != best) {
+            best = {}; /* as near as the one before */
+        }
+    }
+    return best;
+}
+
+std::string suggestion(std::string_view text, const name_list &names) {
+    std::string_view meant = near_miss(text, names);
+    if (!meant.empty())
+        return "did you mean " + quoted(meant) + "?";
+    return names.empty() ? std::string() : "known are " + listed(names);
+}
+
+name_list stanza_names() {
+    name_list names;
+    for (const srtable_ctrl &kind : std::span(sc_tables).first(SC_COUNT))
+        names.emplace_back(kind.sc_name);
+    return names;
+}
+
+name_list attribute_names(const srtable_ctrl &kind) {
+    name_list names;
+    for (const table_attrs &attr : kind.sc_attrs)
+        names.emplace_back(attr.ta_name);
+    return names;
+}
+
+name_list data_type_names() {
+    return {std::begin(vxTypeStr) + 1, std::end(vxTypeStr)}; /* the first stands for none */
+}
+
+name_list variable_type_names() {
+    return {std::begin(vxVarStr), std::end(vxVarStr)};
+}
+
+name_list property_names(int attr_type) {
+    switch (attr_type) {
+    case AT_CLASS_PROPS:
+        return names_of(rc_props);
+    case AT_PATTR_PROPS:
+        return names_of(pa_props);
+    case AT_DATTR_PROPS:
+        return names_of(da_props);
+    default:
+        return names_of(act_props);
+    }
+}
+
+name_list missing_names(const srtable_ctrl &kind, vx_uint32_t mask) {
+    name_list names;
+    for (const table_attrs &attr : kind.sc_attrs)
+        if ((attr.req_bit & OPTIONAL) == 0 && (attr.req_bit & mask) == 0)
+            names.emplace_back(attr.ta_name);
+    return names;
+}
+
+std::string quoted(std::string_view text) {
+    std::string whole;
+    return whole.append("`").append(text).append("`");
+}
+
+std::string listed(const name_list &names) {
+    std::string text;
+    for (size_t i = 0; i < names.size(); ++i) {
+        text += i == 0 ? "" : i + 1 < names.size() ? ", " : " and ";
+        text += quoted(names[i]);
+    }
+    return text;
+}
+
+} // namespace cdef::check

@@ -1,0 +1,190 @@
+/* cdef_check_notes.cpp: what helps to understand an error: the name that was meant, where a thing was first given, what
+ * is missing. */
+
+#include "cdef_check_session.h"
+
+namespace cdef::check {
+
+namespace {
+
+const char *name_of(vx_data_type_t type) {
+    for (size_t i = 0; i < std::size(vxTypeMap); ++i)
+        if (vxTypeMap[i] == type)
+            return vxTypeStr[i];
+    return "UNKNOWN";
+}
+
+const char *form_of(vx_data_type_t type) {
+    switch (scalar_vx(type)) {
+    case VX_INT32:
+    case VX_INT64:
+        return "a decimal integer";
+    case VX_UINT32:
+    case VX_UINT64:
+        return "a decimal integer without a sign";
+    case VX_FLOAT32:
+    case VX_FLOAT64:
+        return "a floating point number";
+    case VX_BINARY_PTR:
+        return "0x and pairs of hexadecimal digits";
+    case VX_CHAR_PTR:
+        return "a text that is not empty";
+    default:
+        return "no value that could be written";
+    }
+}
+
+vx_data_type_t data_type(cdgen &cx) {
+    vx_data_type_t type = VX_UNKNOWN;
+    if (cx.scp->dt_offset >= 0)
+        memcpy(&type, static_cast<char *>(cx.scp->sc_cb(cx)) + cx.scp->dt_offset, sizeof type);
+    return type;
+}
+
+int line_of(const session &check, int kind, const char *attribute) {
+    const srtable_ctrl &table = sc_tables[index_of(kind)];
+    const table_attrs *attr = find_attr(table, attribute);
+    return check.stanzas[index_of(kind)].given[static_cast<size_t>(attr - table.sc_attrs.data())];
+}
+
+/* One error while its notes are added. */
+struct noting {
+    session &check;
+    finding &found;
+    const fatal_exit &failure;
+    int kind; /* of the stanza at fault; -1: none */
+
+    void add(const place &at, std::string text) {
+        if (!text.empty())
+            found.notes.push_back({at, std::move(text)});
+    }
+    void first_given(int line) {
+        if (line != 0)
+            add({line, 0, 0}, "first given here");
+    }
+    const srtable_ctrl &table() const {
+        return sc_tables[index_of(kind)];
+    }
+    const stanza_note &stanza() const {
+        return check.stanzas[index_of(kind)];
+    }
+    name_list missing() const {
+        return missing_names(table(), check.cx.stanzas[index_of(kind)].req_mask);
+    }
+    std::string marked() const {
+        return check.raw.substr(found.at.column - 1, found.at.length);
+    }
+};
+
+void unknown_name(noting &n) {
+    n.add(n.found.at, suggestion(n.marked(), attribute_names(n.table())));
+}
+
+void too_early(noting &n) {
+    if (n.kind == SC_ACTION_OUT_SD_DEFINITION)
+        n.add(n.stanza().header, "`ActionOutSDDefinition` takes its five required attributes only");
+    else
+        n.add(n.stanza().header, "this stanza's " + listed(n.missing()) + " must come first");
+}
+
+void repeated(noting &n) {
+    auto at = static_cast<size_t>(n.check.cx.latest.attr - n.table().sc_attrs.data());
+    n.first_given(n.stanza().given[at]);
+}
+
+void no_sd_attribute(noting &n) {
+    n.add(n.found.at, "it must follow an attribute whose DataType is `SD` or `SDArray` at once");
+}
+
+void incomplete(noting &n) {
+    n.add(n.stanza().header, "this " + quoted(n.table().sc_name) + " lacks " + listed(n.missing()));
+}
+
+void no_class(noting &n) {
+    n.add(n.found.at, "`ControlDefinition` begins a class, and must stand in front");
+}
+
+void second_map(noting &n) {
+    n.first_given(n.check.map_line);
+}
+
+void unknown_property(noting &n) {
+    n.add(n.found.at, suggestion(n.marked(), property_names(n.check.cx.latest.attr->ta_type)));
+}
+
+void unknown_type(noting &n) {
+    n.add(n.found.at, suggestion(n.marked(), data_type_names()));
+}
+
+void unknown_variable_type(noting &n) {
+    n.add(n.found.at, suggestion(n.marked(), variable_type_names()));
+}
+
+void bad_value(noting &n) {
+    session &check = n.check;
+    vx_data_type_t type = data_type(check.cx);
+    bool numeric = scalar_vx(type) >= VX_INT32 && scalar_vx(type) <= VX_FLOAT64;
+    if (numeric && check.overflow_line != 0)
+        n.add({check.overflow_line, 0, 0}, "the number that overflows here makes later ones that are 0, or the limit "
+                                           "of their type, invalid");
+    else if (type == VX_UNKNOWN)
+        n.add(n.found.at, "the stanza has no known DataType");
+    else
+        n.add(n.found.at, quoted(name_of(type)) + " takes " + form_of(type));
+}
+
+void wrong_index(noting &n) {
+    n.add(n.found.at, "expected is " + std::to_string(n.check.cx.expected_sdeli));
+}
+
+void second_manager(noting &n) {
+    n.first_given(n.check.manager_line);
+}
+
+void bad_default(noting &n) {
+    if (n.kind < 0)
+        return;
+    if (!is_sd_kind(n.kind))
+        n.add(n.stanza().data_type, "the DataType of this " + quoted(n.table().sc_name));
+    else
+        for (const mention &odd : n.check.odd_elements)
+            n.add(odd.at, odd.text == "SBS" ? "the element's DataType" : suggestion(odd.text, data_type_names()));
+}
+
+void no_manager(noting &n) {
+    if (n.check.map_line != 0)
+        n.add({n.check.map_line, 0, 0}, "this `ClassToManagerMapping` lacks `ResourceManager`");
+}
+
+void keys(noting &n) {
+    for (const char *key : {"FirstKey", "LastKey"})
+        if (int line = line_of(n.check, SC_CLASS_TO_MANAGER_MAPPING, key))
+            n.add({line, 0, 0}, std::string(key) + " is given here");
+}
+
+struct noting_of {
+    std::string_view code;
+    void (*add)(noting &);
+};
+
+constexpr noting_of notings[] = {
+    {"S106", unknown_name},     {"S108", too_early},    {"S109", repeated},
+    {"S110", no_sd_attribute},  {"S111", incomplete},   {"S112", no_class},
+    {"S113", no_class},         {"S114", no_class},     {"S115", no_class},
+    {"S116", no_class},         {"S117", no_class},     {"S118", second_map},
+    {"S201", unknown_property}, {"S202", unknown_type}, {"S203", unknown_variable_type},
+    {"S207", bad_value},        {"S210", wrong_index},  {"S213", second_manager},
+    {"S214", bad_default},      {"S215", bad_default},  {"S216", bad_default},
+    {"S303", no_manager},       {"S304", keys},
+};
+
+} // namespace
+
+void session::add_notes(finding &found, const fatal_exit &failure, int failed_kind) {
+    noting n = {*this, found, failure, failed_kind};
+    for (const noting_of &each : notings)
+        if (each.code == found.code)
+            each.add(n);
+}
+
+} // namespace cdef::check

@@ -1,0 +1,146 @@
+"""Run the cases of "cdef check": one source, one expectation beside it.
+
+A case is NAME.cdefsrc with NAME.expect.  The expectation holds 'args:' with
+options and 'status:' with the exit status (default 1), then, behind a line
+'---', what is printed: on standard error, and for --format on standard output.
+The source is also checked as standard input if the expectation says 'stdin: yes'.
+With --tables the script checks instead that docs/messages.md, the table of
+messages and the sources name the same messages.
+"""
+
+import argparse
+import json
+import pathlib
+import re
+import shlex
+import subprocess
+import sys
+
+TABLE = "src/cdef_check_messages.cpp"
+ERROR_ROW = re.compile(r'\{"(S\d{3})",\s*"((?:[^"\\]|\\.)+)", \w+, blame::\w+\}')
+WARNING_ROW = re.compile(r'\{[A-Z_]+, "(S\d{3})", "([a-z-]+)",\s*"((?:[^"\\]|\\.)+)"\}')
+STRING = re.compile(r'"((?:[^"\\]|\\.)*)"')
+RAISES = re.compile(
+    r"\b(?:source_error|cdgen_error_exit|bld_error_exit|cannot|table_failure|require_class|default_bound|add_all<\w+>"
+    r"|copied)\((.*?)\);",
+    re.S,
+)
+NAMED_TEXTS = re.compile(r"\b(?:NO_CLASS|COPY_ERROR|DATA_ERROR|no_class) = (\"[^\"]+\")")
+RETURNED_TEXTS = re.compile(r"const char \*message = (.*?);", re.S)
+OTHER_LITERALS = {"", "it is the source file", " cdefsrc_filename cdef_filename"}
+
+
+def read_case(path):
+    """The options, the status, whether standard input is tried, and the expected text."""
+    head, _, text = path.read_text().partition("---\n")
+    keys = dict(line.split(":", 1) for line in head.splitlines() if line.strip())
+    return shlex.split(keys.get("args", "")), int(keys.get("status", "1")), "stdin" in keys, text
+
+
+def difference(title, expected, actual):
+    """Report lines for two texts that should be equal."""
+    if expected == actual:
+        return []
+    return [f"{title} differs; expected:", expected, "actual:", actual]
+
+
+def run(cdef, args, source, stdin=None):
+    """Status and both streams of a check."""
+    command = [cdef, "check", *args, source.name if stdin is None else "-"]
+    result = subprocess.run(command, cwd=source.parent, input=stdin or b"", capture_output=True, timeout=60)
+    return result.returncode, result.stdout.decode(), result.stderr.decode()
+
+
+def check_case(cdef, expectation):
+    """The problems of one case."""
+    args, status, from_stdin, text = read_case(expectation)
+    source = expectation.with_suffix(".cdefsrc")
+    expected = (status, text, "") if "--format" in args else (status, "", text)
+    problems = difference("the result", repr(expected), repr(run(cdef, args, source)))
+    if from_stdin:
+        named = tuple(each.replace(f"{source.name}:", "-:") if isinstance(each, str) else each for each in expected)
+        problems += difference("standard input", repr(named), repr(run(cdef, args, source, source.read_bytes())))
+    return problems
+
+
+def raised(root):
+    """Every text that the compiler's sources give to a fatal exit."""
+    texts = set()
+    for path in sorted(root.glob("src/cdgen*.[ch]*")):
+        source = path.read_text()
+        calls = RAISES.findall(source) + NAMED_TEXTS.findall(source) + RETURNED_TEXTS.findall(source)
+        calls += re.findall(r'\.no_class = ("[^"]+")', source)
+        calls += re.findall(r"fatal_exit\{(.*?)\}", source, re.S) + re.findall(r"report\(cx, \{(.*?)\}", source, re.S)
+        for call in calls:
+            texts |= {bytes(text, "utf-8").decode("unicode_escape") for text in STRING.findall(call)}
+    return {text for text in texts if text not in OTHER_LITERALS and not text.startswith(" [-s]")}
+
+
+def table_rows(root):
+    """Codes and texts of the table of messages, and codes, names and titles of the warnings."""
+    source = (root / TABLE).read_text()
+    return ERROR_ROW.findall(source), WARNING_ROW.findall(source)
+
+
+def check_tables(root):
+    """What the document, the table and the sources do not agree on."""
+    errors, warnings = table_rows(root)
+    document = (root / "docs/messages.md").read_text()
+    sections = {part[:4]: part for part in re.split(r"^### ", document, flags=re.M)}
+    problems = []
+    for code, text, *_ in errors + warnings:
+        section = sections.get(code, "")
+        if f"`{text.strip()}" not in section:
+            problems.append(f"docs/messages.md: {code} does not show {text!r}")
+        if "**Cause**" not in section or "**Cure**" not in section:
+            problems.append(f"docs/messages.md: {code} has no cause or no cure")
+    for code in sections.keys() - {row[0] for row in errors + warnings}:
+        if re.match(r"S\d", code):
+            problems.append(f"docs/messages.md: {code} is in no table")
+    codes = [row[0] for row in errors + warnings]
+    problems += [f"{code} is given twice" for code in set(codes) if codes.count(code) > 1]
+    known = {text for _, text in errors}
+    problems += [f"no code for {text!r}" for text in sorted(raised(root) - known)]
+    problems += [f"nothing in src raises {text!r}" for text in sorted(known - raised(root))]
+    if len(errors) < 60 or len(warnings) < 20:
+        problems.append("the tables have not been found")
+    return problems
+
+
+def check_sarif(cdef, source):
+    """Whether a SARIF log has what the standard requires of the parts that are used."""
+    status, text, _ = run(cdef, ["--format", "sarif"], source)
+    log = json.loads(text)
+    (only,) = log["runs"]
+    rules = {rule["id"] for rule in only["tool"]["driver"]["rules"]}
+    problems = [] if (status, log["version"]) == (1, "2.1.0") and only["results"] else ["no results, or wrong version"]
+    for result in only["results"]:
+        if result["ruleId"] not in rules or result["level"] not in ("error", "warning"):
+            problems.append(f"rule or level: {result}")
+        for place in result["locations"] + result.get("relatedLocations", []):
+            region = place["physicalLocation"].get("region", {"startLine": 1})
+            if region["startLine"] < 1 or region.get("endColumn", 1) < region.get("startColumn", 1):
+                problems.append(f"region: {place}")
+    return problems
+
+
+def main():
+    """Run the cases, or check the tables."""
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--cdef", type=lambda text: pathlib.Path(text).resolve())
+    parser.add_argument("--tables", action="store_true")
+    parser.add_argument("--sarif", type=lambda text: pathlib.Path(text).resolve())
+    parser.add_argument("cases", nargs="*", type=lambda text: pathlib.Path(text).resolve())
+    options = parser.parse_args()
+    root = pathlib.Path(__file__).resolve().parent.parent
+    problems = check_tables(root) if options.tables else []
+    if options.sarif:
+        problems += check_sarif(options.cdef, options.sarif)
+    for case in options.cases:
+        problems += [f"FAIL {case}", *found] if (found := check_case(options.cdef, case)) else []
+    print(*problems, sep="\n")
+    return 1 if problems else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())

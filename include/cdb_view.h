@@ -397,13 +397,14 @@ struct valid_value_context {
     vx_data_type_t type = VX_UNKNOWN;
 };
 
-/* The values from low to high; for a single value, it twice. */
+/* The values from low to high; for a single value, it twice. They are numbers, texts and binaries: no type that has
+ * elements has valid values of its own, so none are followed here. */
 struct valid_value {
     static constexpr std::size_t SIZE = sizeof(vv_entry_t);
 
     valid_value(const valid_value_context &of, std::size_t at)
-        : low(of.tables.valid_vals, at + offsetof(vv_entry_t, vv_low_val), of.type, of.tables.strings),
-          high(of.tables.valid_vals, at + offsetof(vv_entry_t, vv_high_val), of.type, of.tables.strings),
+        : low(of.tables.valid_vals, at + offsetof(vv_entry_t, vv_low_val), of.type, of.tables.strings, NESTING_MAX),
+          high(of.tables.valid_vals, at + offsetof(vv_entry_t, vv_high_val), of.type, of.tables.strings, NESTING_MAX),
           message(of.tables.valid_vals.number<std::uint16_t>(at + offsetof(vv_entry_t, vv_disp_msgid))) {}
 
     value low;
@@ -508,11 +509,13 @@ public:
     value initial_value() const requires std::is_same_v<Record, rsrc_dattr_t> {
         return cell(offsetof(rsrc_dattr_t, ra_init_value));
     }
+    /* Bounds, if they are not another attribute's (verify says so), are numbers, or arrays of a single element without
+     * elements. So nothing deeper is followed. */
     value min_value() const requires std::is_same_v<Record, rsrc_dattr_t> {
-        return cell(offsetof(rsrc_dattr_t, ra_min_value));
+        return cell(offsetof(rsrc_dattr_t, ra_min_value), NESTING_MAX - 1);
     }
     value max_value() const requires std::is_same_v<Record, rsrc_dattr_t> {
-        return cell(offsetof(rsrc_dattr_t, ra_max_value));
+        return cell(offsetof(rsrc_dattr_t, ra_max_value), NESTING_MAX - 1);
     }
     std::string_view expression() const requires std::is_same_v<Record, rsrc_dattr_t> {
         return tables.strings.text(fields.u_ra_express);
@@ -522,8 +525,8 @@ public:
     }
 
 private:
-    value cell(std::size_t offset) const {
-        return {tables.section, at + offset, fields.ra_data_type, tables.strings};
+    value cell(std::size_t offset, unsigned nesting = 0) const {
+        return {tables.section, at + offset, fields.ra_data_type, tables.strings, nesting};
     }
 
     class_tables tables;
@@ -831,6 +834,10 @@ struct rule {
 /* The two rules that, broken, leave the rest of a database readable. */
 inline constexpr std::string_view CODE_CHECKSUM = "CDB104";
 inline constexpr std::string_view CODE_RESERVED = "CDB106";
+
+/* The two rules that, broken, leave a record something that is not its own: valid values, or a bound. */
+inline constexpr std::string_view CODE_CUT_SHORT = "CDB353";
+inline constexpr std::string_view CODE_RANGE_ASTRAY = "CDB452";
 
 /* Where a rule is broken. */
 struct finding {

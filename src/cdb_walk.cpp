@@ -2,57 +2,11 @@
 
 #include "cdb_walk.h"
 
-#include <iterator>
+#include <utility>
 
 namespace cdb {
 
 namespace {
-
-using enum severity;
-
-/* By check. */
-constexpr rule all_rules[] = {
-    {"CDB101", error, "file too short for a header"},
-    {"CDB102", error, "length in the header is not the file's size less 4"},
-    {"CDB103", error, "no format word"},
-    {CODE_CHECKSUM, error, "wrong checksum"},
-    {"CDB105", error, "unknown record size in the header"},
-    {CODE_RESERVED, error, "reserved bytes or filling not zero"},
-    {"CDB107", error, "not the largest ID"},
-    {"CDB201", error, "anchors beyond the end of the file"},
-    {"CDB202", error, "section beyond the end of the file"},
-    {"CDB203", error, "gap or overlap between sections"},
-    {"CDB204", error, "unknown section type"},
-    {"CDB205", warning, "section of an unused type"},
-    {"CDB206", error, "wrong section length"},
-    {"CDB207", error, "section out of order"},
-    {"CDB301", error, "wrong record identifier"},
-    {"CDB302", error, "table not where the one before it ends"},
-    {"CDB303", error, "table beyond the end of the section"},
-    {"CDB304", error, "reference is none"},
-    {"CDB305", error, "reference out of its table"},
-    {"CDB306", error, "reference to no multiple of 8"},
-    {"CDB307", error, "list beyond the end of its table"},
-    {"CDB308", error, "list with two owners, or overlapping lists"},
-    {"CDB309", error, "text out of its table, or without end"},
-    {"CDB310", error, "no data type"},
-    {"CDB311", error, "no variable type"},
-    {"CDB312", error, "variable ID of no dynamic attribute"},
-    {"CDB351", warning, "unknown data type"},
-    {"CDB352", warning, "text missing"},
-    {"CDB353", warning, "attribute cut short by a new class: the valid values are not its own"},
-    {"CDB354", warning, "structured data without definition, or of another length than it"},
-    {"CDB355", warning, "bytes in a table of lists that nothing refers to"},
-    {"CDB401", error, "value out of the strings"},
-    {"CDB402", error, "value at no multiple of 8"},
-    {"CDB403", error, "value with two owners, or overlapping values"},
-    {"CDB404", error, "values nested too deep"},
-    {"CDB405", error, "element of no data type"},
-    {"CDB451", warning, "value missing"},
-    {"CDB452", warning, "range of another attribute's type"},
-    {"CDB453", warning, "structured data differ from their definition"},
-};
-static_assert(std::size(all_rules) == static_cast<std::size_t>(check::COUNT));
 
 std::string hex(std::uint64_t number) {
     constexpr std::string_view digits = "0123456789abcdef";
@@ -81,29 +35,9 @@ constexpr record_size record_sizes[] = {
     {offsetof(orb_cdb_header_t, cdb_hdr_rsrc_depend_size), sizeof(rsrc_depend_t)},
 };
 
-constexpr const field *field_at(std::span<const field> fields, std::size_t offset) {
-    for (const field &f : fields)
-        if (f.offset == offset)
-            return &f;
-    return nullptr;
-}
-
 const spot whole_file = {.section = std::nullopt, .record = "orb_cdb_header_t"};
 
-/* The bit of a dynamic attribute's or a variable's ID. Only its low 16 bits are looked at. */
-std::size_t id_bit(std::uint32_t id) {
-    return id & 0xFFFF;
-}
-
 } // namespace
-
-const rule &rule_of(check broken) {
-    return all_rules[static_cast<std::size_t>(broken)];
-}
-
-std::span<const rule> rules() {
-    return all_rules;
-}
 
 /* ---- Things that references lead to ---------------------------------------------------------------------------- */
 
@@ -184,21 +118,29 @@ void walker::visit_text(const spot &at, const field &ref, std::uint32_t offset, 
         report(check::TEXT_OUTSIDE, at, ref.name, place, std::to_string(offset),
                "a text in " + std::to_string(strings.area.size()) + " bytes");
     else
+        note_text(at, strings, offset);
+}
+
+/* Where texts end, they tell themselves; where they may end, the next one tells: it is to be known first. What is
+ * excused comes last, and may begin amid something else. */
+void walker::note_text(spot at, extent &strings, std::size_t offset) {
+    at.record = "text";
+    at.index = 0;
+    if (excuse)
+        walk_text(at, strings, offset, strings.area.size());
+    else
         strings.text_starts[offset / extent::UNIT] = true;
 }
 
 /* One text, which reaches to the place end at the most: there the next text begins, or the table ends. */
 void walker::walk_text(const spot &at, extent &strings, std::size_t start, std::size_t end) {
     std::size_t file_offset = strings.offset + start;
-    if (strings.is_taken(start)) {
-        report(check::VALUE_SHARED, at, {}, file_offset, "a text inside of another value", "a place of its own");
-        return;
-    }
     std::size_t length = strings.area.part(start, end - start).text(std::size_t{0}).size();
     bool ends = length < end - start;
     add_region(at, file_offset, length + ends, "text");
-    if (!ends)
-        return;
+    if (!ends || strings.claim(start, length + 1) != extent::claim_result::FIRST)
+        return report(check::VALUE_SHARED, at, {}, file_offset, "a text that runs into something else",
+                      "a place of its own");
     std::size_t filling = start + length + 1;
     std::size_t filled = std::min(end, extent::units(filling) * extent::UNIT);
     spot place = at;
@@ -434,6 +376,8 @@ void walker::walk_variable_class(spot at, const bytes &section) {
 
 /* The IDs, rounded up to a multiple of 8, end the section. */
 void walker::walk_variable_ids(const spot &record_at, const bytes &section, std::size_t first, std::size_t count) {
+    if (!std::exchange(dynamic_ids_sorted, true))
+        std::sort(dynamic_ids.begin(), dynamic_ids.end());
     std::size_t length = extent::units(count * sizeof(var_id_t)) * extent::UNIT;
     if (first + length != section.size())
         report(check::SECTION_LENGTH, record_at, "rvc_var_count",
@@ -443,7 +387,7 @@ void walker::walk_variable_ids(const spot &record_at, const bytes &section, std:
     for (; at.index < count; ++at.index, at.offset += sizeof(var_id_t)) {
         add_region(at, at.offset, sizeof(var_id_t), at.record);
         auto id = section.number<var_id_t>(first + at.index * sizeof(var_id_t));
-        if (!dynamic_ids[id_bit(id)])
+        if (!std::binary_search(dynamic_ids.begin(), dynamic_ids.end(), id))
             report(check::VARIABLE_ID, at, {}, at.offset, std::to_string(id), "the ID of a dynamic attribute");
     }
     std::size_t end = first + count * sizeof(var_id_t);
@@ -469,22 +413,21 @@ void walker::walk_class_hash(spot at, const bytes &section) {
 
 /* ---- The walk -------------------------------------------------------------------------------------------------- */
 
-/* What variable classes may refer to; and which class is the last. */
-void walker::look_ahead() {
-    dynamic_ids.resize(id_bit(0xFFFFFFFF) + 1);
+void walker::find_last_class() {
     for (std::size_t i = 0; i < db.section_count(); ++i)
         if (db.anchor(i).cda_type == CDB_DSECT_CLASS)
             last_class = i;
 }
 
 void walker::note_dynamic_id(std::int32_t id, bool of_class) {
-    dynamic_ids[id_bit(static_cast<std::uint32_t>(id) | (of_class ? VAR_ID_CLASS_ATTR : 0))] = true;
+    if (!dynamic_ids_sorted)
+        dynamic_ids.push_back(static_cast<var_id_t>(id) | (of_class ? VAR_ID_CLASS_ATTR : 0));
 }
 
 void walker::walk() {
     if (!walk_header())
         return;
-    look_ahead();
+    find_last_class();
     walk_anchors();
     check_largest_ids();
 }

@@ -53,6 +53,12 @@ enum class check : std::size_t {
 
 const rule &rule_of(check broken);
 
+/* The field at an offset that is one's. */
+constexpr const field *field_at(std::span<const field> fields, std::size_t offset) {
+    auto found = std::find_if(fields.begin(), fields.end(), [offset](const field &f) { return f.offset == offset; });
+    return found == fields.end() ? nullptr : &*found;
+}
+
 /* Those of a record's fields for which a condition holds, picked out while compiling. */
 template <class Record, auto Condition> struct picked_fields {
     static constexpr std::size_t count =
@@ -147,10 +153,12 @@ public:
 
     /* The text that a record's reference leads to. */
     void visit_text(const spot &at, const field &ref, std::uint32_t offset, extent &strings);
+    /* A text at offset, which is inside of the strings and a multiple of extent::UNIT. */
+    void note_text(spot at, extent &strings, std::size_t offset);
     /* Regions of texts and their filling, once all texts are known. */
     void finish_texts(spot at, extent &strings);
 
-    /* A dynamic attribute that variable classes may refer to. */
+    /* A dynamic attribute that the variable classes behind its class may refer to. */
     void note_dynamic_id(std::int32_t id, bool of_class);
 
     const database &db;
@@ -182,17 +190,18 @@ private:
     void walk_class_hash(spot at, const bytes &section);
     void walk_text(const spot &at, extent &strings, std::size_t start, std::size_t end);
     void expect_rounded(const spot &at, const bytes &section, std::size_t strings_at);
-    void look_ahead();
+    void find_last_class();
 
     struct section_kind;
     static const section_kind section_kinds[];
 
     std::vector<finding> &findings;
     std::vector<region> *regions;
-    std::size_t sections_end = 0;  /* of what has been walked, in the file */
-    int section_rank = 0;          /* the highest so far, in the order of types */
-    std::size_t last_class = 0;    /* position of the last class among the anchors */
-    std::vector<bool> dynamic_ids; /* by the low 16 bits of a variable ID: a dynamic attribute has it */
+    std::size_t sections_end = 0;      /* of what has been walked, in the file */
+    int section_rank = 0;              /* the highest so far, in the order of types */
+    std::size_t last_class = 0;        /* position of the last class among the anchors */
+    std::vector<var_id_t> dynamic_ids; /* of the classes before the first variable class */
+    bool dynamic_ids_sorted = false;   /* a variable class was met */
 };
 
 /* Walks one class section (cdb_walk_class.cpp). is_last: no class follows it in the file. */

@@ -1,20 +1,12 @@
-/* cdb_walk_class.cpp: the walk over a class section: its records, and the lists, values and texts that they lead to. */
+/* cdb_walk_class.cpp: the walk over a class section: its records, and the lists that they lead to. */
 
-#include "cdb_walk.h"
+#include "cdb_walk_class.h"
+
+#include <utility>
 
 namespace cdb {
 
 namespace {
-
-/* A list table's entries. */
-struct list_format {
-    std::string_view record;
-    std::string_view id_field;
-    std::string_view count_field;
-    vx_uint32_t id;
-    std::size_t entry; /* bytes */
-    std::span<const field> fields;
-};
 
 constexpr std::size_t LIST_HEAD = 8; /* identifier and count, of all three */
 constexpr std::size_t LIST_COUNT = 4;
@@ -61,81 +53,7 @@ constexpr class_table class_tables_in_order[] = {
     {&rsrc_class_t::u_rc_strings, "u_rc_strings", true, [](const rsrc_class_t &) { return std::size_t{0}; }},
 };
 
-class class_walk {
-public:
-    class_walk(walker &w, const spot &class_at, const bytes &whole, bool last)
-        : walk(w), at(class_at), section(whole), rc(whole.record<rsrc_class_t>(0)), is_last(last),
-          strings(table(rc.u_rc_strings, SIZE_MAX)), valid_vals(table(rc.u_rc_valid_vals, rc.rc_valval_size)),
-          variety_lists(table(rc.u_rc_variety_lists, rc.rc_varlist_size)),
-          sd_defs(table(rc.u_rc_sd_defs, rc.rc_sd_size)) {}
-
-    void run();
-
-private:
-    /* What has to wait until the genuine owners have claimed what is theirs. */
-    struct postponed {
-        check excuse;
-        spot record_at;
-        const field *what;
-        std::uint32_t reference; /* of a valid-value list */
-        vx_data_type_t type;
-    };
-
-    extent table(const cdb_ref_t &ref, std::size_t size) const {
-        return {section.part(ref.offset[0], size), at.offset + ref.offset[0]};
-    }
-
-    void check_tables();
-    template <class Record>
-    void walk_attributes(const cdb_ref_t &ref, std::size_t count, std::string_view record, vx_uint32_t id);
-    template <class Record> void walk_attribute(const spot &place, std::size_t offset, vx_uint32_t id, bool last);
-    template <class Record> void check_structure(const spot &place, const Record &record);
-    void check_structure_value(const spot &place, const sd_definition &definition, const value &cell);
-    void walk_actions(const cdb_ref_t &ref, std::size_t count, vx_uint32_t id);
-    void walk_errors();
-    void walk_depends();
-    bool postpone(const spot &place, const field &f, std::uint32_t word, vx_data_type_t type);
-    void walk_postponed();
-
-    void expect_data_type(const spot &place, std::string_view field, std::size_t offset, vx_data_type_t type);
-    void follow(const spot &place, const bytes &area, std::size_t offset, std::span<const field> fields,
-                vx_data_type_t owner_type);
-    void follow_reference(const spot &place, const field &f, std::uint32_t word, vx_data_type_t type);
-    std::optional<std::size_t> claim_list(const spot &place, const field &ref, std::uint32_t offset, extent &lists,
-                                          const list_format &format);
-    void walk_varieties(const spot &place, const field &ref, std::uint32_t offset);
-    void walk_valid_values(const spot &place, const field &ref, std::uint32_t offset, vx_data_type_t type);
-    void walk_sd_definition(const spot &place, const field &ref, std::uint32_t offset);
-
-    void walk_value(const spot &place, const field &f, std::size_t file_offset, std::uint32_t word,
-                    vx_data_type_t type);
-    void walk_container(const spot &place, std::string_view field, std::size_t file_offset, std::uint32_t offset,
-                        vx_data_type_t type);
-    bool claim_value(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset,
-                     std::size_t length);
-    void walk_binary(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset);
-    void walk_handle(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset);
-    void walk_array(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset,
-                    vx_data_type_t type);
-    void walk_structured_data(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset);
-    void walk_filling(const spot &place, std::size_t offset, std::size_t end);
-    void report_unreached(extent &lists, std::string_view name);
-
-    walker &walk;
-    spot at;
-    bytes section;
-    rsrc_class_t rc;
-    bool is_last; /* no class follows */
-    extent strings;
-    extent valid_vals;
-    extent variety_lists;
-    extent sd_defs;
-    bool may_be_cut_short = false; /* this and the next: the record being walked */
-    bool range_may_be_astray = false;
-    bool postponing = true;
-    unsigned nesting = 0;
-    std::vector<postponed> later;
-};
+} // namespace
 
 /* ---- Tables ---------------------------------------------------------------------------------------------------- */
 
@@ -144,21 +62,21 @@ void class_walk::check_tables() {
     for (const class_table &t : class_tables_in_order) {
         std::size_t offset = (rc.*t.ref).offset[0];
         bool unlocated = !t.located && offset == 0;
-        std::size_t field_at = at.offset;
+        std::size_t place = at.offset;
         for (const field &f : class_fields)
             if (f.name == t.field)
-                field_at += f.offset;
+                place += f.offset;
         if (!unlocated && offset != end)
-            walk.report(check::TABLE_PLACE, at, t.field, field_at, offset, end);
+            walk.report(check::TABLE_PLACE, at, t.field, place, offset, end);
         end += t.size(rc);
         if (end > section.size()) {
-            walk.report(check::TABLE_OUTSIDE, at, t.field, field_at, "ends at " + std::to_string(end),
+            walk.report(check::TABLE_OUTSIDE, at, t.field, place, "ends at " + std::to_string(end),
                         "at most " + std::to_string(section.size()));
             return;
         }
     }
     if ((section.size() - end) % extent::UNIT != 0)
-        walk.report(check::SECTION_LENGTH, at, "u_rc_strings", at.offset,
+        walk.report(check::SECTION_LENGTH, at, "u_rc_strings", at.offset + offsetof(rsrc_class_t, u_rc_strings),
                     std::to_string(section.size() - end) + " bytes of strings", "a multiple of 8");
 }
 
@@ -172,32 +90,6 @@ void class_walk::expect_data_type(const spot &place, std::string_view field, std
     else if (type == VX_UNKNOWN || type == VX_SBS_PTR)
         walk.report(check::UNKNOWN_TYPE, place, field, place.offset + offset, std::string(name_of(type)),
                     "a type with values");
-}
-
-/* What a new class found open went into the old one as it was: the last record of a table, in a class that is not the
- * last. Its reference to valid values may be 0 and mean nothing. Likewise a range may have come from a class
- * attribute's stanza, and be of its type. */
-bool class_walk::postpone(const spot &place, const field &f, std::uint32_t word, vx_data_type_t type) {
-    if (!postponing)
-        return false;
-    bool range = range_may_be_astray && is_out_of_line(type) && word != CDB_NONE &&
-                 (f.offset == offsetof(rsrc_dattr_t, ra_min_value) || f.offset == offsetof(rsrc_dattr_t, ra_max_value));
-    bool list = may_be_cut_short && f.to == target::valid_vals && word == 0;
-    if (range || list)
-        later.push_back({range ? check::RANGE_ASTRAY : check::CUT_SHORT, place, &f, word, type});
-    return range || list;
-}
-
-void class_walk::walk_postponed() {
-    postponing = false;
-    for (const postponed &p : later) {
-        walk.excuse = p.excuse;
-        if (p.what->kind == field_kind::value)
-            walk_value(p.record_at, *p.what, p.record_at.offset + p.what->offset, p.reference, p.type);
-        else
-            follow_reference(p.record_at, *p.what, p.reference, p.type);
-        walk.excuse.reset();
-    }
 }
 
 void class_walk::follow_reference(const spot &place, const field &f, std::uint32_t word, vx_data_type_t type) {
@@ -216,20 +108,65 @@ void class_walk::follow_reference(const spot &place, const field &f, std::uint32
     }
 }
 
+void class_walk::follow_field(const spot &place, const field &f, std::uint32_t word, vx_data_type_t type) {
+    if (f.kind == field_kind::reference)
+        follow_reference(place, f, word, type);
+    else if (is_out_of_line(type))
+        walk_container(place, f.name, place.offset + f.offset, word, type);
+}
+
 /* Everything that a record's leading fields lead to. owner_type: of its values, where the record itself does not know
  * it. */
 void class_walk::follow(const spot &place, const bytes &area, std::size_t offset, std::span<const field> fields,
                         vx_data_type_t owner_type) {
     for (const field &f : fields) {
-        auto word = area.number<std::uint32_t>(offset + f.offset);
         auto type = f.type_at == TYPE_OF_OWNER ? owner_type : area.number<vx_data_type_t>(offset + f.type_at);
-        if (postpone(place, f, word, type))
-            continue;
-        if (f.kind == field_kind::reference)
-            follow_reference(place, f, word, type);
-        else
-            walk_value(place, f, place.offset + f.offset, word, type);
+        follow_field(place, f, area.number<std::uint32_t>(offset + f.offset), type);
     }
+}
+
+static bool is_bound(const field &f) {
+    return f.kind == field_kind::value &&
+           (f.offset == offsetof(rsrc_dattr_t, ra_min_value) || f.offset == offsetof(rsrc_dattr_t, ra_max_value));
+}
+
+/* What a new class found open went into the old one as it was: the last record of a table, in a class that is not the
+ * last. Its reference to valid values may be 0 and mean nothing. Likewise a resource attribute's range may have come
+ * from a class attribute's stanza, and be of its type. */
+template <class Record>
+void class_walk::follow_attribute(const spot &place, std::size_t offset, vx_uint32_t id, bool last) {
+    auto type = section.number<vx_data_type_t>(offset + offsetof(Record, ra_data_type));
+    bool may_be_cut_short = last && !is_last;
+    bool may_be_astray = id == CDB_ID_DATTR && is_out_of_line(type);
+    for (const field &f : leading_fields_of<Record>) {
+        doubtful d = {place, &f, section.number<std::uint32_t>(offset + f.offset), type};
+        if (may_be_cut_short && f.to == target::valid_vals && d.word == 0)
+            doubtful_lists.push_back(d);
+        else if (may_be_astray && is_bound(f))
+            doubtful_bounds.push_back(d);
+        else
+            follow_field(place, f, d.word, type);
+    }
+}
+
+void class_walk::walk_doubtful_lists() {
+    walk.excuse = check::CUT_SHORT;
+    for (const doubtful &d : doubtful_lists)
+        walk_valid_values(d.record_at, *d.what, d.word, d.type);
+    walk.excuse.reset();
+}
+
+/* Only arrays have bounds that are out of line. */
+void class_walk::walk_doubtful_bounds() {
+    walk.excuse = check::RANGE_ASTRAY;
+    for (const doubtful &d : doubtful_bounds) {
+        std::size_t file_offset = d.record_at.offset + d.what->offset;
+        if (is_array(d.type) || d.word == 0)
+            walk_container(d.record_at, d.what->name, file_offset, d.word, d.type);
+        else if (d.word != CDB_NONE)
+            walk.report(check::RANGE_ASTRAY, d.record_at, d.what->name, file_offset, std::to_string(d.word), "none");
+    }
+    walk.excuse.reset();
 }
 
 template <class Record>
@@ -244,10 +181,7 @@ void class_walk::walk_attribute(const spot &place, std::size_t offset, vx_uint32
             walk.report(check::VARIABLE_TYPE, place, "ra_var_type", place.offset + offsetof(rsrc_dattr_t, ra_var_type),
                         std::to_string(record.ra_var_type), "0 to 3");
     }
-    may_be_cut_short = last && !is_last;
-    range_may_be_astray = id == CDB_ID_DATTR;
-    follow(place, section, offset, leading_fields_of<Record>, record.ra_data_type);
-    may_be_cut_short = range_may_be_astray = false;
+    follow_attribute<Record>(place, offset, id, last);
     if (element_type(record.ra_data_type) == VX_SD_PTR)
         check_structure(place, record);
 }
@@ -275,16 +209,19 @@ template <class Record> void class_walk::check_structure(const spot &place, cons
                     absent ? "a definition" : std::to_string(definition.size()) + " elements");
     attribute<Record> attr(tables, place.offset - at.offset);
     if constexpr (std::is_same_v<Record, rsrc_pattr_t>)
-        check_structure_value(place, definition, attr.default_value());
+        check_structure_value(place, *field_at(pattr_fields, offsetof(rsrc_pattr_t, ra_dflt_value)), definition,
+                              attr.default_value());
     else
-        check_structure_value(place, definition, attr.initial_value());
+        check_structure_value(place, *field_at(dattr_fields, offsetof(rsrc_dattr_t, ra_init_value)), definition,
+                              attr.initial_value());
 }
 
-void class_walk::check_structure_value(const spot &place, const sd_definition &definition, const value &cell) {
+void class_walk::check_structure_value(const spot &place, const field &f, const sd_definition &definition,
+                                       const value &cell) {
     if (is_array(cell.type())) {
         value_list values = cell.elements();
         if (!values.empty())
-            check_structure_value(place, definition, values[0]);
+            check_structure_value(place, f, definition, values[0]);
         return;
     }
     if (!cell.present())
@@ -294,7 +231,8 @@ void class_walk::check_structure_value(const spot &place, const sd_definition &d
     for (std::size_t i = 0; same && i < values.size(); ++i)
         same = values[i].type() == definition[i].type();
     if (!same)
-        walk.report(check::SD_DIFFERS, place, "value", place.offset, std::to_string(values.size()) + " elements",
+        walk.report(check::SD_DIFFERS, place, f.name, place.offset + f.offset,
+                    std::to_string(values.size()) + " elements",
                     std::to_string(definition.size()) + " elements of the definition's types");
 }
 
@@ -419,132 +357,6 @@ void class_walk::report_unreached(extent &lists, std::string_view name) {
     }
 }
 
-/* ---- Values ---------------------------------------------------------------------------------------------------- */
-
-/* file_offset: of the cell. word: the first one in it. */
-void class_walk::walk_value(const spot &place, const field &f, std::size_t file_offset, std::uint32_t word,
-                            vx_data_type_t type) {
-    if (is_out_of_line(type))
-        walk_container(place, f.name, file_offset, word, type);
-}
-
-void class_walk::walk_container(const spot &place, std::string_view field, std::size_t file_offset,
-                                std::uint32_t offset, vx_data_type_t type) {
-    if (offset == CDB_NONE)
-        return;
-    if (offset == 0)
-        return walk.report(check::VALUE_MISSING, place, field, file_offset, "0", "a value's place, or none");
-    if (offset >= strings.area.size() || (type == VX_CHAR_PTR && offset >= strings.texts_end))
-        return walk.report(check::VALUE_OUTSIDE, place, field, file_offset, std::to_string(offset),
-                           "in " + std::to_string(strings.area.size()) + " bytes");
-    if (offset % extent::UNIT != 0)
-        return walk.report(check::VALUE_UNALIGNED, place, field, file_offset, std::to_string(offset),
-                           "a multiple of 8");
-    if (type == VX_CHAR_PTR)
-        strings.text_starts[offset / extent::UNIT] = true;
-    else if (type == VX_BINARY_PTR)
-        walk_binary(place, field, file_offset, offset);
-    else if (type == VX_RSRC_HANDLE_PTR)
-        walk_handle(place, field, file_offset, offset);
-    else if (nesting >= NESTING_MAX)
-        walk.report(check::VALUE_NESTING, place, field, file_offset, nesting + 1, NESTING_MAX);
-    else {
-        ++nesting;
-        if (type == VX_SD_PTR)
-            walk_structured_data(place, field, file_offset, offset);
-        else
-            walk_array(place, field, file_offset, offset, type);
-        --nesting;
-    }
-}
-
-/* False, and said so, unless length bytes from offset on are there and belong to nobody else. */
-bool class_walk::claim_value(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset,
-                             std::size_t length) {
-    if (!strings.area.holds(offset, length)) {
-        walk.report(check::VALUE_OUTSIDE, place, field, file_offset,
-                    std::to_string(offset) + " + " + std::to_string(length),
-                    "at most " + std::to_string(strings.area.size()));
-        return false;
-    }
-    if (strings.claim(offset, length) != extent::claim_result::FIRST) {
-        walk.report(check::VALUE_SHARED, place, field, file_offset, std::to_string(offset), "a value of its own");
-        return false;
-    }
-    return true;
-}
-
-/* From offset to the next multiple of 8, in the strings. */
-void class_walk::walk_filling(const spot &place, std::size_t offset, std::size_t end) {
-    std::size_t rounded = std::min(extent::units(end) * extent::UNIT, strings.area.size());
-    spot filling = {place.section, place.record, place.index, offset};
-    filling.offset = strings.offset + end;
-    walk.expect_zero(filling, "filling", strings.area, end, rounded - end);
-    walk.add_region(filling, filling.offset, rounded - end, "filling");
-}
-
-/* The length and the bytes are two pieces. */
-void class_walk::walk_binary(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset) {
-    std::size_t length = strings.area.number<std::uint32_t>(offset);
-    if (!claim_value(place, field, file_offset, offset, value::BINARY_BYTES + length))
-        return;
-    spot binary = {at.section, "binary", 0, strings.offset + offset};
-    walk.add_region(binary, binary.offset, sizeof(vx_uint32_t), "length");
-    walk_filling(binary, offset, offset + sizeof(vx_uint32_t));
-    walk.add_region(binary, binary.offset + value::BINARY_BYTES, length, "binary");
-    walk_filling(binary, offset, offset + value::BINARY_BYTES + length);
-}
-
-void class_walk::walk_handle(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset) {
-    constexpr std::size_t SIZE = sizeof(vx_resource_handle_t);
-    if (!claim_value(place, field, file_offset, offset, SIZE))
-        return;
-    spot handle = {at.section, "handle", 0, strings.offset + offset};
-    walk.add_region(handle, handle.offset, SIZE, "handle");
-    walk_filling(handle, offset, offset + SIZE);
-}
-
-void class_walk::walk_array(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset,
-                            vx_data_type_t type) {
-    std::size_t count = strings.area.number<std::uint32_t>(offset);
-    if (!claim_value(place, field, file_offset, offset, value::ELEMENTS + count * sizeof(vx_value_t)))
-        return;
-    spot array = {at.section, "vx_array_t", 0, strings.offset + offset};
-    walk.visit<vx_array_t>(array, strings.area, offset);
-    vx_data_type_t element = element_type(type);
-    spot cell = {at.section, "vx_value_t", 0, array.offset + value::ELEMENTS};
-    for (; cell.index < count; ++cell.index, cell.offset += sizeof(vx_value_t)) {
-        walk.add_region(cell, cell.offset, sizeof(vx_value_t), cell.record);
-        if (is_out_of_line(element))
-            walk_container(cell, "elements", cell.offset,
-                           strings.area.number<std::uint32_t>(cell.offset - strings.offset), element);
-    }
-}
-
-/* There is room for one element even if there is none. */
-void class_walk::walk_structured_data(const spot &place, std::string_view field, std::size_t file_offset,
-                                      std::size_t offset) {
-    constexpr std::size_t SIZE = sizeof(vx_structured_data_element_t);
-    std::size_t count = strings.area.number<std::uint32_t>(offset);
-    if (!claim_value(place, field, file_offset, offset, value::ELEMENTS + std::max<std::size_t>(count, 1) * SIZE))
-        return;
-    spot sd = {at.section, "vx_structured_data_t", 0, strings.offset + offset};
-    walk.visit<vx_structured_data_t>(sd, strings.area, offset);
-    spot element = {at.section, "vx_structured_data_element_t", 0, sd.offset + value::ELEMENTS};
-    if (count == 0) {
-        walk.expect_zero(element, "filling", strings.area, offset + value::ELEMENTS, SIZE);
-        walk.add_region(element, element.offset, SIZE, "filling");
-    }
-    for (; element.index < count; ++element.index, element.offset += SIZE) {
-        std::size_t in_strings = element.offset - strings.offset;
-        auto type = strings.area.number<vx_data_type_t>(in_strings);
-        walk.visit<vx_structured_data_element_t>(element, strings.area, in_strings);
-        if (!is_data_type(type))
-            walk.report(check::VALUE_TYPE, element, "data_type", element.offset, std::to_string(type), "0 to 22");
-        follow(element, strings.area, in_strings, leading_fields_of<vx_structured_data_element_t>, VX_UNKNOWN);
-    }
-}
-
 /* ---- The class ------------------------------------------------------------------------------------------------- */
 
 void class_walk::run() {
@@ -560,14 +372,14 @@ void class_walk::run() {
     walk_actions(rc.u_rc_actions, rc.rc_num_actions, CDB_ID_ACTION);
     walk_errors();
     walk_depends();
-    walk_postponed();
+    walk.finish_texts(at, strings); /* now all that has an owner without doubt is known */
+    walk_doubtful_lists();
+    walk_doubtful_bounds();
+    walk_empty_binaries();
     report_unreached(variety_lists, "variety_list_t");
     report_unreached(sd_defs, "sd_def_t");
     report_unreached(valid_vals, "valid_values_t");
-    walk.finish_texts(at, strings);
 }
-
-} // namespace
 
 void walk_class(walker &walk, const spot &at, const bytes &section, bool is_last) {
     class_walk(walk, at, section, is_last).run();

@@ -1,5 +1,6 @@
 /* cdef_check_json.cpp: findings for programs: JSON of our own, and SARIF 2.1.0. */
 
+#include "cdef.h"
 #include "cdef_check.h"
 
 #include <nlohmann/json.hpp>
@@ -12,11 +13,6 @@ namespace cdef::check {
 namespace {
 
 using json = nlohmann::ordered_json;
-
-/* Bytes that are no UTF-8 are replaced. */
-std::string dump(const json &data) {
-    return data.dump(2, ' ', false, json::error_handler_t::replace) + "\n";
-}
 
 const char *level_of(const finding &found) {
     return found.error ? "error" : "warning";
@@ -58,7 +54,7 @@ std::string as_json(std::span<const result> checked) {
                        {"warnings", each.warnings},
                        {"findings", std::move(findings)}});
     }
-    return dump(all);
+    return json_text(all);
 }
 
 namespace {
@@ -134,9 +130,9 @@ std::string as_sarif(std::span<const result> checked) {
     json run = {{"tool", {{"driver", std::move(driver)}}},
                 {"columnKind", "unicodeCodePoints"},
                 {"results", std::move(results)}};
-    return dump({{"$schema", "https://json.schemastore.org/sarif-2.1.0.json"},
-                 {"version", "2.1.0"},
-                 {"runs", json::array({std::move(run)})}});
+    return json_text({{"$schema", "https://json.schemastore.org/sarif-2.1.0.json"},
+                      {"version", "2.1.0"},
+                      {"runs", json::array({std::move(run)})}});
 }
 
 } // namespace cdef::check

@@ -85,7 +85,7 @@ int verify(const verify_options &options) {
         text += v.text;
         all.push_back(std::move(v.data));
     }
-    print(options.as_json ? all.dump(2) + "\n" : text);
+    print(options.as_json ? json_text(all) : text);
     return pass ? OK : FOUND;
 }
 

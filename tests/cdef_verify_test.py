@@ -1,0 +1,343 @@
+"""Test `cdef verify`: what it prints, its exit statuses, and that it finds no
+error in anything that the compiler makes.
+
+The images are those of image/make_images.py.
+"""
+
+import argparse
+import json
+import os
+import pathlib
+import subprocess
+import sys
+import tempfile
+import unittest
+
+import golden
+
+OPTIONS = argparse.Namespace()
+HERE = pathlib.Path(__file__).resolve().parent
+
+WRONG = "broken/CDB301-class.little.cdef"
+WRONG_LINE = (
+    "{}: error: section 0, rsrc_class_t 0, rc_cb_ID at offset 144: wrong record identifier: "
+    "found 0x43444230, expected 0x43444231 [CDB301]\n"
+)
+CARELESS = "cut_short.little.cdef"
+CARELESS_LINE = (
+    "{}: warning: section 0, rsrc_pattr_t 0, u_ra_valid_vals at offset 384: "
+    "attribute cut short by a new class: the valid values are not its own: "
+    "found 0, expected in 0 bytes [CDB353]\n"
+)
+OF_THE_FILE = "broken/CDB102-one-less.little.cdef"
+OF_THE_FILE_LINE = (
+    "{}: error: file, orb_cdb_header_t 0, cdb_hdr_length at offset 0: "
+    "length in the header is not the file's size less 4: found 1487, expected 1488 [CDB102]\n"
+)
+SOUND = "small.little.cdef"
+WRONG_FINDING = {
+    "code": "CDB301",
+    "severity": "error",
+    "title": "wrong record identifier",
+    "section": 0,
+    "record": "rsrc_class_t",
+    "index": 0,
+    "field": "rc_cb_ID",
+    "offset": 144,
+    "found": "0x43444230",
+    "expected": "0x43444231",
+}
+CARELESS_FINDING = {
+    "code": "CDB353",
+    "severity": "warning",
+    "title": "attribute cut short by a new class: the valid values are not its own",
+    "section": 0,
+    "record": "rsrc_pattr_t",
+    "index": 0,
+    "field": "u_ra_valid_vals",
+    "offset": 384,
+    "found": "0",
+    "expected": "in 0 bytes",
+}
+
+
+def verify(*operands, stdin=subprocess.DEVNULL, stdout=subprocess.PIPE, data=None):
+    """Status, output and messages of `cdef verify`, run among the images."""
+    given = {"input": data} if data is not None else {"stdin": stdin}
+    result = subprocess.run(
+        [OPTIONS.cdef, "verify", *operands], cwd=OPTIONS.images, stdout=stdout, stderr=subprocess.PIPE, check=False,
+        timeout=60, **given,
+    )
+    return result.returncode, (result.stdout or b"").decode(), result.stderr.decode()
+
+
+class Output(unittest.TestCase):
+    """What is printed, and the statuses."""
+
+    def test_nothing_of_a_sound_database(self):
+        for order in ("little", "big"):
+            self.assertEqual(verify(f"whole.{order}.cdef"), (0, "", ""))
+
+    def test_a_line_for_an_error(self):
+        self.assertEqual(verify(WRONG), (1, WRONG_LINE.format(WRONG), ""))
+
+    def test_a_line_for_the_file_as_a_whole(self):
+        self.assertEqual(verify(OF_THE_FILE), (1, OF_THE_FILE_LINE.format(OF_THE_FILE), ""))
+
+    def test_a_warning_is_no_failure(self):
+        self.assertEqual(verify(CARELESS), (0, CARELESS_LINE.format(CARELESS), ""))
+
+    def test_werror_makes_it_one(self):
+        self.assertEqual(verify("--werror", CARELESS), (1, CARELESS_LINE.format(CARELESS), ""))
+
+    def test_werror_finds_nothing_in_a_sound_database(self):
+        self.assertEqual(verify("--werror", SOUND), (0, "", ""))
+
+    def test_quiet_shows_no_warnings(self):
+        for option in ("-q", "--quiet"):
+            self.assertEqual(verify(option, CARELESS), (0, "", ""))
+
+    def test_quiet_shows_errors(self):
+        self.assertEqual(verify("-q", WRONG), (1, WRONG_LINE.format(WRONG), ""))
+
+    def test_quiet_and_werror(self):
+        self.assertEqual(verify("-q", "--werror", CARELESS), (1, "", ""))
+
+    def test_several_files_in_their_order(self):
+        lines = CARELESS_LINE.format(CARELESS) + WRONG_LINE.format(WRONG)
+        self.assertEqual(verify(CARELESS, WRONG, SOUND), (1, lines, ""))
+        self.assertEqual(verify(SOUND, CARELESS), (0, CARELESS_LINE.format(CARELESS), ""))
+
+    def test_help(self):
+        status, text, messages = verify("--help")
+        self.assertEqual((status, messages), (0, ""))
+        for option in ("--json", "--werror", "-q,--quiet", "FILE"):
+            self.assertIn(option, text)
+
+
+class Json(unittest.TestCase):
+    """The shape of --json."""
+
+    def parsed(self, expected_status, *operands):
+        status, text, messages = verify("--json", *operands)
+        self.assertEqual((status, messages), (expected_status, ""))
+        self.assertTrue(text.endswith("]\n"))
+        return json.loads(text)
+
+    def test_sound(self):
+        self.assertEqual(self.parsed(0, SOUND), [{"file": SOUND, "sound": True, "findings": []}])
+
+    def test_errors_and_warnings(self):
+        expected = [
+            {"file": WRONG, "sound": False, "findings": [WRONG_FINDING]},
+            {"file": CARELESS, "sound": True, "findings": [CARELESS_FINDING]},
+        ]
+        self.assertEqual(self.parsed(1, WRONG, CARELESS), expected)
+
+    def test_keys_in_their_order(self):
+        self.assertEqual(list(self.parsed(1, WRONG)[0]), ["file", "sound", "findings"])
+        self.assertEqual(list(self.parsed(1, WRONG)[0]["findings"][0]), list(WRONG_FINDING))
+
+    def test_of_the_file_as_a_whole(self):
+        self.assertIsNone(self.parsed(1, OF_THE_FILE)[0]["findings"][0]["section"])
+
+    def test_quiet(self):
+        self.assertEqual(self.parsed(0, "-q", CARELESS), [{"file": CARELESS, "sound": True, "findings": []}])
+
+    def test_werror(self):
+        expected = [{"file": CARELESS, "sound": False, "findings": [CARELESS_FINDING]}]
+        self.assertEqual(self.parsed(1, "--werror", CARELESS), expected)
+
+    def test_file_name_that_is_no_text(self):
+        with tempfile.TemporaryDirectory() as directory:
+            path = os.fsencode(directory) + b"/\xff.cdef"
+            pathlib.Path(os.fsdecode(path)).write_bytes((OPTIONS.images / SOUND).read_bytes())
+            status, text, messages = verify("--json", path)
+            self.assertEqual((status, messages), (0, ""))
+            self.assertIs(json.loads(text)[0]["sound"], True)
+
+
+class Input(unittest.TestCase):
+    """Standard input, and what cannot be read."""
+
+    def test_standard_input(self):
+        with open(OPTIONS.images / WRONG, "rb") as file:
+            self.assertEqual(verify("-", stdin=file), (1, WRONG_LINE.format("-"), ""))
+
+    def test_standard_input_that_is_a_pipe(self):
+        data = (OPTIONS.images / WRONG).read_bytes()
+        self.assertEqual(verify("-", data=data), (1, WRONG_LINE.format("-"), ""))
+        self.assertEqual(verify("-", data=(OPTIONS.images / SOUND).read_bytes()), (0, "", ""))
+
+    def test_missing_file(self):
+        self.assertEqual(verify("none.cdef"), (2, "", "cdef: none.cdef: No such file or directory\n"))
+
+    def test_missing_file_outweighs_an_error(self):
+        status, _, messages = verify(WRONG, "none.cdef")
+        self.assertEqual((status, messages), (2, "cdef: none.cdef: No such file or directory\n"))
+
+    def test_directory(self):
+        self.assertEqual(verify("broken"), (2, "", "cdef: broken: Is a directory\n"))
+
+    def test_empty_name(self):
+        self.assertEqual(verify(""), (2, "", "cdef: : No such file or directory\n"))
+
+    @unittest.skipIf(os.geteuid() == 0, "root may read everything")
+    def test_file_without_permission(self):
+        with tempfile.NamedTemporaryFile() as file:
+            os.chmod(file.name, 0)
+            self.assertEqual(verify(file.name), (2, "", f"cdef: {file.name}: Permission denied\n"))
+
+    def test_no_file_named(self):
+        status, text, messages = verify()
+        self.assertEqual((status, text), (2, ""))
+        self.assertTrue(messages.startswith("cdef: "), messages)
+
+    def test_unknown_option(self):
+        status, text, messages = verify("--nothing", SOUND)
+        self.assertEqual((status, text), (2, ""))
+        self.assertIn("--nothing", messages)
+
+    def test_name_that_looks_like_an_option(self):
+        with tempfile.TemporaryDirectory() as directory:
+            path = pathlib.Path(directory) / "-x.cdef"
+            path.write_bytes((OPTIONS.images / WRONG).read_bytes())
+            result = subprocess.run(
+                [OPTIONS.cdef, "verify", "--", "-x.cdef"], cwd=directory, capture_output=True, check=False, timeout=60
+            )
+            self.assertEqual((result.returncode, result.stdout.decode()), (1, WRONG_LINE.format("-x.cdef")))
+
+
+@unittest.skipUnless(pathlib.Path("/dev/full").exists(), "a device that is always full is needed")
+class FullDevice(unittest.TestCase):
+    """Output that cannot be written."""
+
+    MESSAGE = "cdef: standard output: No space left on device\n"
+
+    def on_full(self, *operands):
+        with open("/dev/full", "wb") as full:
+            status, _, messages = verify(*operands, stdout=full)
+        return status, messages
+
+    def test_findings(self):
+        for operands in ([WRONG], [CARELESS], ["--json", SOUND]):
+            self.assertEqual(self.on_full(*operands), (2, self.MESSAGE))
+
+    def test_nothing_to_say(self):
+        self.assertEqual(self.on_full(SOUND), (0, ""))
+
+    def test_help(self):
+        self.assertEqual(self.on_full("--help")[0], 2)
+
+
+CLASS = """ControlDefinition
+	FileVersion=1.0.0.0
+ResourceClass
+	Description=1
+	DisplayName=2
+	Properties=HasResources,CanDefine
+	ClassPermTemplate=0
+	ResourcePermTemplate=0
+	Name=C
+"""
+MAP = """ClassToManagerMapping
+	ResourceManager=Mgr1
+	FirstKey=1
+	LastKey=100
+	MessageCatalog=mgr1.cat
+	DescriptiveMessageSet=1
+"""
+
+
+def persistent(name, data_type, *more):
+    """The stanza of a persistent attribute."""
+    lines = [f"Name={name}", "Description=3", "DisplayName=4", "Id=7", f"DataType={data_type}", "VarietyRange=1,1", *more]
+    return "PersistentResourceAttribute\n" + "".join(f"\t{line}\n" for line in lines)
+
+
+def dynamic(level, name, data_type, *more):
+    """The stanza of a dynamic attribute."""
+    lines = [f"Name={name}", "Description=3", "DisplayName=4", "Id=7", f"DataType={data_type}"]
+    lines += ["VariableType=Quantity", "VarietyRange=1,1", *more]
+    return f"Dynamic{level}Attribute\n" + "".join(f"\t{line}\n" for line in lines)
+
+
+# A class attribute's Range that an open resource attribute of another type
+# takes, and that happens to look like a place in the strings there.
+STRAY_RANGES = {
+    "a name read as an array": CLASS
+    + persistent("A", "Int32")
+    + "".join(persistent(f"LongName{number:060}", "Int32") for number in range(20))
+    + dynamic("Resource", "AB", "Int32Array")
+    + dynamic("Class", "CD", "UInt32", "Range=8,8")
+    + MAP,
+    "a binary read as text, in an attribute cut short": CLASS
+    + persistent("P", "Binary", "DefaultValue=0x00112233445566778899")
+    + persistent("Q", "Int32")
+    + dynamic("Resource", "AB", "String")
+    + dynamic("Class", "CD", "UInt32", "Range=24,32")
+    + CLASS
+    + MAP,
+    "the middle of a name read as text, in an attribute cut short": CLASS
+    + persistent("LongNameLongNameLongNameLongName", "Int32")
+    + dynamic("Resource", "AB", "String")
+    + dynamic("Class", "CD", "UInt32", "Range=16,24")
+    + CLASS
+    + MAP,
+}
+
+
+class Compiled(unittest.TestCase):
+    """What the compiler makes has no errors."""
+
+    def expect_sound(self, database, what):
+        self.assertEqual(verify("-q", database), (0, "", ""), what)
+
+    def test_golden_sources_in_both_orders(self):
+        count = 0
+        with tempfile.TemporaryDirectory() as directory:
+            database = pathlib.Path(directory) / "made.cdef"
+            for path in golden.cases_of([HERE / "golden"]):
+                case = golden.Case(path)
+                for extra in ([], ["-s"]) if case.status == 0 else ():
+                    _, _, after = golden.run(case, OPTIONS.cdgen, extra)
+                    database.write_bytes(after[case.out])
+                    self.expect_sound(database, f"{case.name} {extra}")
+                    count += 1
+        self.assertGreater(count, 200)
+
+    def compile(self, source, directory, extra):
+        path = pathlib.Path(directory) / "made.cdefsrc"
+        path.write_text(source)
+        database = path.with_suffix(".cdef")
+        subprocess.run([OPTIONS.cdgen, *extra, path, database], check=True, stdout=subprocess.DEVNULL)
+        return database
+
+    def test_examples_in_both_orders(self):
+        with tempfile.TemporaryDirectory() as directory:
+            for source in sorted((HERE.parent / "examples").glob("*.cdefsrc")):
+                for extra in ([], ["-s"]):
+                    database = self.compile(source.read_text(), directory, extra)
+                    self.assertEqual(verify("--werror", database), (0, "", ""), source)
+
+    def test_ranges_that_have_gone_astray(self):
+        with tempfile.TemporaryDirectory() as directory:
+            for name, source in STRAY_RANGES.items():
+                for extra in ([], ["-s"]):
+                    with self.subTest(name, extra=extra):
+                        self.expect_sound(self.compile(source, directory, extra), name)
+
+
+def main():
+    """Run the tests with the programs named."""
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--cdef", type=pathlib.Path, required=True)
+    parser.add_argument("--cdgen", type=pathlib.Path, required=True)
+    parser.add_argument("--images", type=pathlib.Path, required=True, help="where make_images.py has put them")
+    _, rest = parser.parse_known_args(namespace=OPTIONS)
+    OPTIONS.cdef, OPTIONS.cdgen = OPTIONS.cdef.resolve(), OPTIONS.cdgen.resolve()
+    unittest.main(argv=[sys.argv[0], *rest])
+
+
+if __name__ == "__main__":
+    main()

@@ -1,0 +1,175 @@
+"""Make the images that the reader's tests look into, in both byte orders.
+
+Nothing of the compiler or of the reader takes part: the images are described by
+hand (NAME.image, in the notation of cdb_image.py), and where there is something
+wrong with one, the description of what (broken/NAME.broken) names a sound image
+and the one thing that is changed in it.  Written are NAME.little.cdef and
+NAME.big.cdef, and the same below broken/.
+
+Besides the items of cdb_image.py a description may hold
+
+    section 7                     a section of any type, by its number
+    u16 N ..., u32 N ...          numbers as they stand, no padding
+    zeros N                       as many zero bytes
+    text "text"                   text with its NUL, no padding
+
+A broken image has 'key: value' lines; '//' starts a comment:
+
+    base: NAME                    the sound image
+    put: u8|u16|u32|cell AT VALUE a number written over what stands at AT; a
+                                  cell is TYPE:VALUE
+    hex: AT BYTES                 bytes written over, the same in both orders
+    cut: SIZE                     the file ends there
+    append: BYTES                 and there is more behind it
+    keep: length|checksum         do not work it out again: it is the thing
+    order: native                 for the tests: only a machine's own order
+    finding...:                   for the tests, which compare it with what the
+                                  reader says
+
+What a file's length and checksum should be is worked out after the change.
+
+The worked example of docs/format.md, byte by byte, is an image too: document;
+document.rows says what stands where in it.
+"""
+
+import argparse
+import json
+import pathlib
+import re
+import struct
+import sys
+
+HERE = pathlib.Path(__file__).resolve().parent
+sys.path.insert(0, str(HERE.parent))
+
+import cdb_image  # noqa: E402  (the path has to be set first)
+
+ORDERS = ("little", "big")
+WIDTHS = {"u8": 1, "u16": 2, "u32": 4}
+DOCUMENT = HERE.parent.parent / "docs" / "format.md"
+DOCUMENT_ROW = re.compile(r"\| (\d+) \| `([0-9a-f ]+)` \| ?(.*) \|")
+
+
+def numbers(width, texts, order):
+    """Numbers of a width in a byte order."""
+    return b"".join((int(text, 0) % (1 << 8 * width)).to_bytes(width, order) for text in texts)
+
+
+def put_line(image, line, groups):
+    """Append what one line of a description says."""
+    word, _, rest = line.partition(" ")
+    if word == "section" and rest.strip().isdigit():
+        image.sections.append((int(rest), len(image.body)))
+    elif word in WIDTHS:
+        image.put(numbers(WIDTHS[word], rest.split(), image.order), word)
+    elif word == "zeros":
+        image.put(bytes(int(rest)), word)
+    elif word == "text":
+        image.put(json.loads(rest).encode("latin-1") + b"\0", word)
+    else:
+        cdb_image.put_line(image, line, groups)
+
+
+def assemble(path, order):
+    """The bytes of a description in one byte order, as a machine of that order would write them."""
+    image = cdb_image.Image(order, order)
+    groups = {}
+    for line in cdb_image.logical_lines(path.read_text(), path.parent):
+        try:
+            put_line(image, line, groups)
+        except (cdb_image.NotationError, ValueError, KeyError, IndexError) as problem:
+            raise SystemExit(f"{path}: {line}: {problem!r}") from problem
+    return image.finish()[0]
+
+
+def document_rows():
+    """Offset, bytes and content of each row of the worked example."""
+    for line in DOCUMENT.read_text().splitlines():
+        row = DOCUMENT_ROW.fullmatch(line)
+        if row:
+            yield int(row[1]), bytes.fromhex(row[2]), row[3]
+
+
+def document():
+    """The worked example, little-endian as it is printed."""
+    data = bytearray()
+    for at, content, _ in document_rows():
+        assert at == len(data), at
+        data += content
+    return bytes(data)
+
+
+def document_regions():
+    """Offset, size and content of each thing in the worked example; one that takes two rows is joined."""
+    regions = []
+    for at, content, text in document_rows():
+        if text:
+            regions.append([at, len(content), text])
+        else:
+            regions[-1][1] += len(content)
+    return "".join(f"{at} {size} {text}\n" for at, size, text in regions)
+
+
+def change(data, key, value, order):
+    """The image with one line of a broken image's description done to it."""
+    if key == "put":
+        width, at, number = value.split()
+        at = int(at)
+        new = cdb_image.cell(number, order, order) if width == "cell" else numbers(WIDTHS[width], [number], order)
+        assert at + len(new) <= len(data), value
+        data[at:at + len(new)] = new
+    elif key == "hex":
+        at, _, text = value.partition(" ")
+        new = bytes.fromhex(text)
+        assert int(at) + len(new) <= len(data), value
+        data[int(at):int(at) + len(new)] = new
+    elif key == "cut":
+        assert int(value) < len(data), value
+        del data[int(value):]
+    elif key == "append":
+        data += bytes.fromhex(value)
+
+
+def settle(data, order, kept):
+    """Put in length and checksum, but for the one that is kept."""
+    prefix = cdb_image.mark(order)
+    if "length" not in kept and len(data) >= 4:
+        struct.pack_into(prefix + "I", data, 0, len(data) - 4)
+    if "checksum" not in kept and len(data) >= 8:
+        struct.pack_into(prefix + "I", data, 4, cdb_image.checksum(data, order))
+
+
+def broken(path, bases, order):
+    """The bytes of a broken image in one byte order."""
+    lines = [line.split("//", 1)[0].strip() for line in path.read_text().splitlines()]
+    items = [tuple(part.strip() for part in line.split(":", 1)) for line in lines if line]
+    keys = [key for key, _ in items]
+    if keys.count("base") != 1 or not all(len(item) == 2 for item in items):
+        raise SystemExit(f"{path}: no base, or a line that is not 'key: value'")
+    data = bytearray(bases[dict(items)["base"], order])
+    for key, value in items:
+        if key not in ("base", "put", "hex", "cut", "append", "keep", "order") and not key.startswith("finding"):
+            raise SystemExit(f"{path}: unknown key {key}")
+        change(data, key, value, order)
+    settle(data, order, [value for key, value in items if key == "keep"])
+    return bytes(data)
+
+
+def main():
+    """Write all images."""
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--out", type=pathlib.Path, required=True, help="the directory to write to")
+    options = parser.parse_args()
+    (options.out / "broken").mkdir(parents=True, exist_ok=True)
+    bases = {(path.stem, order): assemble(path, order) for path in sorted(HERE.glob("*.image")) for order in ORDERS}
+    bases["document", "little"] = document()
+    (options.out / "document.rows").write_text(document_regions())
+    for (name, order), data in bases.items():
+        (options.out / f"{name}.{order}.cdef").write_bytes(data)
+    for path in sorted((HERE / "broken").glob("*.broken")):
+        for order in ORDERS:
+            (options.out / "broken" / f"{path.stem}.{order}.cdef").write_bytes(broken(path, bases, order))
+
+
+if __name__ == "__main__":
+    main()

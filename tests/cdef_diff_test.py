@@ -1,0 +1,386 @@
+"""Compare databases with cdef diff: what it says, and what it calls compatible.
+
+A case is a file below tests/cdef/diff of blocks; a block is a line that names
+it and the lines up to the next such line:
+
+    replace     lines of base.cdefsrc, which stand there once
+    with        what stands there in the second source; no lines remove them
+    diff        what cdef diff says of the two; nothing if they are the same
+    compat      what cdef diff --compat says of them
+
+replace and with may come several times.  Lines in front of the first block
+say what the case is for.  Each comparison runs in all four combinations of
+byte orders, and cdef diff the other way round too, where all that is new and
+all that is gone change places.
+
+Everything else is a check in this file, by name.
+"""
+
+import argparse
+import itertools
+import json
+import os
+import pathlib
+import subprocess
+import sys
+import tempfile
+
+CASES = pathlib.Path(__file__).parent / "cdef" / "diff"
+BLOCKS = ("replace", "with", "diff", "compat")
+TIMEOUT = 60
+TURNED = {"-": "+", "+": "-"}
+
+
+class Programs:
+    """The two programs, and a directory to run them in."""
+
+    def __init__(self, options, directory):
+        self.cdgen, self.cdef, self.directory = options.cdgen, options.cdef, pathlib.Path(directory)
+
+    def compile(self, source, name, *options, stamp=False):
+        """Compile a text; the database's name."""
+        environment = dict(os.environ)
+        environment.pop("VX_CDB_FORCE_EMPTY_TIMESTAMP", None)
+        if not stamp:
+            environment["VX_CDB_FORCE_EMPTY_TIMESTAMP"] = ""
+        (self.directory / "source").write_text(source)
+        subprocess.run(
+            [self.cdgen, *options, "source", name], cwd=self.directory, env=environment, check=True, timeout=TIMEOUT
+        )
+        return name
+
+    def diff(self, *arguments, stdin=b""):
+        """Status, standard output and standard error of one comparison."""
+        result = subprocess.run(
+            [self.cdef, "diff", *arguments], cwd=self.directory, input=stdin, capture_output=True, timeout=TIMEOUT
+        )
+        return result.returncode, result.stdout.decode(), result.stderr.decode()
+
+    def patch(self, name, offset, data):
+        """Write bytes over those of a database."""
+        contents = bytearray((self.directory / name).read_bytes())
+        contents[offset : offset + len(data)] = data
+        (self.directory / name).write_bytes(contents)
+
+
+def base():
+    """The source that all cases change."""
+    return (CASES / "base.cdefsrc").read_text()
+
+
+def blocks_of(text):
+    """(name, lines) of a case's blocks."""
+    blocks = []
+    for line in text.splitlines():
+        if line in BLOCKS:
+            blocks.append((line, []))
+        elif blocks:
+            blocks[-1][1].append(line)
+    return blocks
+
+
+def replaced(source, old, new):
+    """The source with one run of lines in place of another."""
+    whole, lines = "\n" + source, "\n" + "\n".join(old) + "\n"
+    if whole.count(lines) != 1:
+        raise ValueError(f"stands {whole.count(lines)} times in the base: {old}")
+    return whole.replace(lines, "\n" + "".join(line + "\n" for line in new))[1:]
+
+
+def read_case(path):
+    """The second source and the expected texts of both comparisons."""
+    blocks = blocks_of(path.read_text())
+    source = base()
+    for (name, old), (other, new) in itertools.pairwise(blocks):
+        if name == "replace":
+            if other != "with":
+                raise ValueError("replace without with")
+            source = replaced(source, old, new)
+    texts = {name: "".join(line + "\n" for line in lines) for name, lines in blocks if name in ("diff", "compat")}
+    return source, texts["diff"], texts["compat"]
+
+
+def turned(text):
+    """What the comparison the other way round says, its lines in any order."""
+    lines = []
+    for line in text.splitlines():
+        if line[0] == "~":
+            words, _, values = line.partition(": ")
+            label = next(label for label in LABELS if values.startswith(label + " "))
+            before, after = values[len(label) + 1 :].split(" -> ")
+            line = f"{words}: {label} {after} -> {before}"
+        lines.append(TURNED.get(line[0], line[0]) + line[1:])
+    return sorted(lines)
+
+
+LABELS = (
+    "alias",
+    "class permission template",
+    "confirmation",
+    "default",
+    "description",
+    "display name",
+    "expression description",
+    "expression",
+    "first key",
+    "group name",
+    "group",
+    "highest element index",
+    "index",
+    "Id",
+    "initial value",
+    "last key",
+    "locator",
+    "lower bound",
+    "message catalog",
+    "message set",
+    "observation interval",
+    "permission",
+    "properties",
+    "re-arm description",
+    "re-arm expression",
+    "reporting interval",
+    "resource permission template",
+    "time-out",
+    "type",
+    "upper bound",
+    "variable type",
+    "version",
+)
+
+
+def expect(problems, what, actual, expected):
+    """Note a difference."""
+    if actual != expected:
+        problems.append(f"{what}:\n  expected {expected!r}\n  actual   {actual!r}")
+
+
+def check_case(programs, path):
+    """All comparisons of one case."""
+    problems = []
+    source, difference, breaches = read_case(path)
+    databases = [
+        (programs.compile(base(), f"a{order}.cdef", *order.split()), programs.compile(source, f"b{order}.cdef", *order.split()))
+        for order in ("", "-s")
+    ]
+    for a, b in itertools.product((a for a, _ in databases), (b for _, b in databases)):
+        expect(problems, f"{a} {b}", programs.diff(a, b), (1 if difference else 0, difference, ""))
+        expect(problems, f"--compat {a} {b}", programs.diff("--compat", a, b), (1 if breaches else 0, breaches, ""))
+        status, back, _ = programs.diff(b, a)
+        expect(problems, f"{b} {a}", (status, sorted(back.splitlines())), (1 if difference else 0, turned(difference)))
+    return problems
+
+
+# ---- Checks ----------------------------------------------------------------
+
+MAP = base().partition("ClassToManagerMapping\n")[2]
+
+
+def class_source(*stanzas, head="", control="ControlDefinition\n\tFileVersion=1.0.0.0\n"):
+    """A small source of given stanzas."""
+    resource = "\tDescription=1\n\tDisplayName=2\n\tProperties=CanDefine\n\tClassPermTemplate=0\n\tResourcePermTemplate=0\n"
+    return control + "ResourceClass\n" + resource + head + "".join(stanzas) + "ClassToManagerMapping\n" + MAP
+
+
+def attribute(name, number, *lines, kind="PersistentResourceAttribute", datatype="Int32"):
+    """A stanza of an attribute."""
+    given = [f"Name={name}", "Description=3", "DisplayName=4", f"Id={number}", f"DataType={datatype}", "VarietyRange=0,1"]
+    if kind.startswith("Dynamic"):
+        given.append("VariableType=State")
+    return kind + "\n" + "".join(f"\t{line}\n" for line in [*given, *lines])
+
+
+def layout_is_not_compared(programs, problems):
+    """The order of stanzas, of lines and of sections' contents, checksum, time and what nothing refers to."""
+    a, b = attribute("A", 1, "DefaultValue=5"), attribute("B", 2, "DefaultValue=x", "DefaultValue=y", datatype="String")
+    d = attribute("D", 3, kind="DynamicClassAttribute")
+    first = programs.compile(class_source(a, b, d, head="\tName=C\n"), "first.cdef")
+    moved = class_source(d, b.replace("\tDefaultValue=x\n", ""), a, head="\tName=C\n")
+    second = programs.compile(moved, "second.cdef", "-s", stamp=True)
+    programs.patch(second, 4, b"wrong sum"[:4])
+    expect(problems, "diff", programs.diff(first, second), (0, "", ""))
+
+
+def classes_are_named_where_there_are_several(programs, problems):
+    """With two classes in one of the databases the class is said."""
+    control = "ControlDefinition\n\tFileVersion=1.0.0.0\n"
+    resource = "ResourceClass\n\tDescription=1\n\tDisplayName=2\n\tProperties=CanDefine\n\tClassPermTemplate=0\n\tResourcePermTemplate=0\n"
+    second = control + resource + "\tName=Second\n"
+    one = programs.compile(class_source(attribute("A", 1), head="\tName=First\n"), "one.cdef")
+    two = programs.compile(class_source(attribute("A", 2), second, head="\tName=First\n"), "two.cdef")
+    status, text, _ = programs.diff("--compat", one, two)
+    line = "~ ResourceClass 'First', PersistentResourceAttribute 'A': Id 1 -> 2 (readers know it by its number)\n"
+    expect(problems, "changed", (status, text), (1, line))
+    status, text, _ = programs.diff("--compat", two, one)
+    expect(problems, "removed", (status, "- ResourceClass 'Second' (readers miss it)\n" in text), (1, True))
+
+
+def equal_names_pair_by_position(programs, problems):
+    """Two attributes of one name are two; the one too many is the last."""
+    one = programs.compile(class_source(attribute("A", 1), attribute("A", 2), head="\tName=C\n"), "one.cdef")
+    two = programs.compile(class_source(*(attribute("A", i) for i in (1, 3, 4)), head="\tName=C\n"), "two.cdef")
+    text = "~ PersistentResourceAttribute 'A': Id 2 -> 3\n+ PersistentResourceAttribute 'A'\n"
+    expect(problems, "diff", programs.diff(one, two), (1, text, ""))
+
+
+def texts_are_escaped(programs, problems):
+    """Nothing of a name can act on a terminal."""
+    one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
+    two = programs.compile(class_source(attribute("a\x1b[2J'\\\x7fü", 1), head="\tName=C\n"), "two.cdef")
+    text = "+ PersistentResourceAttribute 'a\\x1b[2J\\'\\\\\\x7f\\xc3\\xbc'\n"
+    expect(problems, "diff", programs.diff(one, two), (1, text, ""))
+
+
+def values_of_every_type(programs, problems):
+    """How values read."""
+    values = {
+        "Int32": ("-1", "-1"),
+        "UInt64": ("18446744073709551615", "18446744073709551615"),
+        "Float32": ("0.1", "0.1"),
+        "Float64": ("-inf", "-inf"),
+        "String": ("it's", "'it\\'s'"),
+        "Binary": ("0x00fF", "0x00ff"),
+        "Int64Array": ("7", "[7]"),
+        "StringArray": ("x", "['x']"),
+    }
+    nothing = {"String": "''", "Binary": "0x", "Int64Array": "[0]", "StringArray": "['']"}
+    one = programs.compile(class_source(*(attribute(t, 1, datatype=t) for t in values), head="\tName=C\n"), "one.cdef")
+    stanzas = (attribute(t, 1, f"DefaultValue={v[0]}", datatype=t) for t, v in values.items())
+    two = programs.compile(class_source(*stanzas, head="\tName=C\n"), "two.cdef", "-s")
+    lines = [f"~ PersistentResourceAttribute '{t}': default {nothing.get(t, 0)} -> {v[1]}\n" for t, v in values.items()]
+    expect(problems, "diff", programs.diff(one, two), (1, "".join(lines), ""))
+
+
+def missing_values_are_nothing(programs, problems):
+    """An SD-typed attribute without a run has no value, and one with a run has elements and a value."""
+    run = "PAttrSDDefinition\n\tElementName=E\n\tDescription=1\n\tDisplayName=2\n\tElementIndex=0\n\tDataType=Int32\n"
+    one = programs.compile(class_source(attribute("A", 1, datatype="SD"), head="\tName=C\n"), "one.cdef")
+    two = programs.compile(class_source(attribute("A", 1, datatype="SD"), run, head="\tName=C\n"), "two.cdef")
+    lines = [
+        "~ PersistentResourceAttribute 'A': default nothing -> {Int32 0}\n",
+        "~ PersistentResourceAttribute 'A': highest element index none -> 0\n",
+        "+ PersistentResourceAttribute 'A', element 'E'\n",
+    ]
+    expect(problems, "diff", programs.diff(one, two), (1, "".join(lines), ""))
+
+
+def fields_without_a_line_are_compared(programs, problems):
+    """Fields that no source sets: in the header, an anchor, the class, the manager and the map."""
+    name = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
+    # Anchors stand at 80; the class at 128 has 224 bytes and strings of 8, the manager 24 and 16, then comes the map.
+    places = {12: 1, 92: 2, 128 + 208: 3, 128 + 232 + 4: 4, 128 + 232 + 40 + 30: 5}
+    programs.compile(class_source(head="\tName=C\n"), "two.cdef")
+    for offset, value in places.items():
+        programs.patch("two.cdef", offset, bytes([value]))
+    lines = [
+        "~ database: sequence number 0 -> 1\n",
+        "~ ResourceClass 'C': class number 0 -> 3\n",
+        "~ ResourceClass 'C': revision 0 -> 2\n",
+        "~ ResourceManager 'DiskManager': number 0 -> 4\n",
+        "~ ClassToManagerMapping: rcm_asnno_start 0 -> 5\n",
+    ]
+    # The largest numbers in the header follow those of the class and the manager.
+    programs.patch("two.cdef", 28, bytes([4, 0, 3, 0]))
+    expect(problems, "diff", programs.diff(name, "two.cdef"), (1, "".join(lines), ""))
+
+
+def json_says_the_same(programs, problems):
+    """One object for each difference."""
+    one = programs.compile(class_source(attribute("A", 1), attribute("B", 2), head="\tName=C\n"), "one.cdef")
+    two = programs.compile(class_source(attribute("A", 3), head="\tName=C\n"), "two.cdef")
+    status, text, _ = programs.diff("--json", one, two)
+    path = [{"kind": "ResourceClass", "name": "'C'"}]
+    changed = {
+        "change": "changed",
+        "path": [*path, {"kind": "PersistentResourceAttribute", "name": "'A'"}],
+        "field": "ra_attr_id",
+        "before": "1",
+        "after": "3",
+        "breaks": "readers know it by its number",
+    }
+    removed = {
+        "change": "removed",
+        "path": [*path, {"kind": "PersistentResourceAttribute", "name": "'B'"}],
+        "breaks": "readers miss it",
+    }
+    expect(problems, "different", (status, json.loads(text)), (1, [changed, removed]))
+    status, text, _ = programs.diff("--json", one, one)
+    expect(problems, "same", (status, json.loads(text)), (0, []))
+
+
+def one_may_be_standard_input(programs, problems):
+    """Either of the two, but not both."""
+    one = programs.compile(class_source(attribute("A", 1), head="\tName=C\n"), "one.cdef")
+    two = programs.compile(class_source(head="\tName=C\n"), "two.cdef")
+    contents = (programs.directory / one).read_bytes()
+    expect(problems, "A", programs.diff("-", two, stdin=contents), (1, "- PersistentResourceAttribute 'A'\n", ""))
+    expect(problems, "B", programs.diff(two, "-", stdin=contents), (1, "+ PersistentResourceAttribute 'A'\n", ""))
+    expect(problems, "both", programs.diff("-", "-", stdin=contents)[:2], (2, ""))
+
+
+def trouble_is_status_2(programs, problems):
+    """A file that is not there, that is no database, or that is broken."""
+    one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
+    (programs.directory / "text").write_text("no database\n")
+    programs.compile(class_source(head="\tName=C\n"), "broken.cdef")
+    programs.patch("broken.cdef", 128, b"XXXX")
+    for other in ("missing", "text", "broken.cdef"):
+        for arguments in ((one, other), (other, one), ("--compat", one, other)):
+            status, text, message = programs.diff(*arguments)
+            expect(problems, str(arguments), (status, text, message.startswith(f"cdef: {other}: ")), (2, "", True))
+
+
+CHECKS = [
+    layout_is_not_compared,
+    classes_are_named_where_there_are_several,
+    equal_names_pair_by_position,
+    texts_are_escaped,
+    values_of_every_type,
+    missing_values_are_nothing,
+    fields_without_a_line_are_compared,
+    json_says_the_same,
+    one_may_be_standard_input,
+    trouble_is_status_2,
+]
+
+
+def run(name, options):
+    """The problems of one case or check."""
+    with tempfile.TemporaryDirectory() as directory:
+        programs = Programs(options, directory)
+        path = CASES / f"{name}.case"
+        if path.exists():
+            return check_case(programs, path)
+        problems = []
+        {check.__name__: check for check in CHECKS}[name](programs, problems)
+        return problems
+
+
+def names():
+    """All cases and checks."""
+    return [path.stem for path in sorted(CASES.glob("*.case"))] + [check.__name__ for check in CHECKS]
+
+
+def main():
+    """Run the named ones, or all, and print the count; without programs, print the names."""
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--cdgen", type=pathlib.Path)
+    parser.add_argument("--cdef", type=pathlib.Path)
+    parser.add_argument("names", nargs="*")
+    options = parser.parse_args()
+    if options.cdgen is None or options.cdef is None:
+        print("\n".join(names()))
+        return 0
+    options.cdgen, options.cdef = options.cdgen.resolve(), options.cdef.resolve()
+    failed = 0
+    for name in options.names or names():
+        problems = run(name, options)
+        failed += bool(problems)
+        if problems:
+            print(f"FAIL {name}", *problems, sep="\n    ")
+    print(f"{len(options.names or names()) - failed} passed, {failed} failed")
+    return 1 if failed else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())

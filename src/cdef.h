@@ -58,6 +58,7 @@ bool wants_colour();
 
 /* Each adds its subcommand to the program. When it runs, it sets status. */
 void add_verify(CLI::App &app, int &status);
+void add_source(CLI::App &app, int &status);
 void add_diff(CLI::App &app, int &status);
 void add_dump(CLI::App &app, int &status);
 void add_check(CLI::App &app, int &status);

@@ -73,7 +73,7 @@ int run(int argc, char **argv) {
         return std::string("cdef: ") + usage.what() + "\nRun 'cdef --help' for more.\n";
     });
     int status = OK;
-    for (auto add : {add_verify, add_dump, add_diff, add_check})
+    for (auto add : {add_verify, add_dump, add_diff, add_source, add_check})
         add(app, status);
     try {
         app.parse(argc, argv);

@@ -1,0 +1,204 @@
+"""Write sources with cdef source: what they look like, and that they compile back.
+
+A case is tests/cdef/source/NAME.cdefsrc, which is compiled, or NAME.image, a
+database described as cdb_image.py says; and beside it NAME.expect, the source
+that is expected, or NAME.error, the message of one that is refused.
+
+Besides, whatever compiles must come back: the source of a database compiles to
+one that cdef diff calls identical, and the source of that one is the same
+source.  That holds for every golden source, the twins, the examples, and for
+generated sources, in both byte orders.
+"""
+
+import argparse
+import os
+import pathlib
+import subprocess
+import sys
+import tempfile
+
+import cdb_image
+import cdef_sources
+import golden
+
+TESTS = pathlib.Path(__file__).parent
+CASES = TESTS / "cdef" / "source"
+GENERATED_GROUPS = 6
+GENERATED_EACH = 50
+TIMEOUT = 60
+TROUBLE = 2
+
+# Names in the directory that a test runs in.
+DATABASE = "database"
+SOURCE = "source"
+
+
+class Programs:
+    """The two programs."""
+
+    def __init__(self, options):
+        self.cdgen, self.cdef = options.cdgen, options.cdef
+
+    def run(self, directory, *command):
+        """One run of a program."""
+        environment = {**os.environ, "VX_CDB_FORCE_EMPTY_TIMESTAMP": "", "LC_ALL": "C"}
+        return subprocess.run(
+            command, cwd=directory, env=environment, stdin=subprocess.DEVNULL, capture_output=True, timeout=TIMEOUT
+        )
+
+    def compile(self, directory, source, out, swap):
+        """The bytes of a compiled source, or None, and the message."""
+        (directory / SOURCE).write_bytes(source)
+        (directory / out).parent.mkdir(parents=True, exist_ok=True)
+        result = self.run(directory, self.cdgen, *(["-s"] if swap else []), SOURCE, out)
+        return (directory / out).read_bytes() if result.returncode == 0 else None, result.stderr.decode()
+
+    def source(self, directory, database):
+        """The run that writes the source of a database."""
+        (directory / DATABASE).write_bytes(database)
+        return self.run(directory, self.cdef, "source", DATABASE)
+
+
+def round_trip(programs, source, out="out.cdef", swap=False):
+    """The problems of one source on its way back; None if it does not compile."""
+    with tempfile.TemporaryDirectory() as name:
+        directory = pathlib.Path(name)
+        first, _ = programs.compile(directory, source, out, swap)
+        if first is None:
+            return None
+        (directory / "first").write_bytes(first)
+        written = programs.source(directory, first)
+        if written.returncode != 0:
+            return [f"no source: {written.stderr.decode()}"]
+        second, message = programs.compile(directory, written.stdout, out, swap)
+        if second is None:
+            return [f"does not compile: {message}", written.stdout.decode(errors="replace")]
+        problems = []
+        difference = programs.run(directory, programs.cdef, "diff", "first", out)
+        if difference.returncode != 0:
+            problems.append(f"differs: {(difference.stdout + difference.stderr).decode()}")
+        again = programs.source(directory, second)
+        if again.stdout != written.stdout:
+            problems.append(f"another source the second time: {again.stderr.decode()}")
+        return problems + ([written.stdout.decode(errors="replace")] if problems else [])
+
+
+def both_orders(programs, source, out="out.cdef"):
+    """The problems in both byte orders; None if the source does not compile."""
+    native = round_trip(programs, source, out)
+    return None if native is None else native + round_trip(programs, source, out, swap=True)
+
+
+# ---- Properties ------------------------------------------------------------
+
+
+def golden_sources():
+    """(name, text, output file) of all sources that compile."""
+    for path in sorted((TESTS / "golden").rglob("*.expect")):
+        case = golden.Case(path)
+        if case.status == 0:
+            yield path.stem, case.source.read_bytes(), case.out
+
+
+def plain_sources():
+    """The same of those without an expectation."""
+    for directory in (TESTS / "twins", TESTS.parent / "examples", TESTS / "cdef" / "diff", CASES):
+        for path in sorted(directory.glob("*.cdefsrc")):
+            yield path.stem, path.read_bytes(), "out.cdef"
+
+
+def check_sources(programs, sources):
+    """Every one of the sources compiles, and comes back."""
+    problems = []
+    count = 0
+    for name, text, out in sources:
+        found = both_orders(programs, text, out)
+        problems += [f"{name}: does not compile"] if found is None else [f"{name}: {line}" for line in found]
+        count += 1
+    return problems if count else ["no sources"]
+
+
+def check_generated(programs, group):
+    """Generated sources come back; most of them have to compile."""
+    problems = []
+    compiled = 0
+    for seed in range(group * GENERATED_EACH, (group + 1) * GENERATED_EACH):
+        text = cdef_sources.source(seed)
+        found = both_orders(programs, text)
+        compiled += found is not None
+        if found:
+            problems += [f"seed {seed}: {line}" for line in found]
+    if compiled < GENERATED_EACH * 3 // 4:
+        problems.append(f"only {compiled} of {GENERATED_EACH} compile")
+    return problems
+
+
+PROPERTIES = {
+    "all-golden-sources": lambda programs: check_sources(programs, golden_sources()),
+    "all-other-sources": lambda programs: check_sources(programs, plain_sources()),
+    **{
+        f"generated-sources-{group}": lambda programs, group=group: check_generated(programs, group)
+        for group in range(GENERATED_GROUPS)
+    },
+}
+
+
+# ---- Cases -----------------------------------------------------------------
+
+
+def databases_of(programs, path):
+    """A case's database in both byte orders."""
+    if path.with_suffix(".image").exists():
+        text = path.with_suffix(".image").read_text()
+        return [cdb_image.assemble(text, order, base_dir=TESTS / "golden" / "image") for order in ("little", "big")]
+    with tempfile.TemporaryDirectory() as name:
+        text = path.with_suffix(".cdefsrc").read_bytes()
+        return [programs.compile(pathlib.Path(name), text, "out.cdef", swap)[0] for swap in (False, True)]
+
+
+def check_case(programs, path):
+    """The source or the message, for both byte orders."""
+    refused = path.with_suffix(".error").exists()
+    text = path.with_suffix(".error" if refused else ".expect").read_bytes()
+    expected = (TROUBLE, b"", text) if refused else (0, text, b"")
+    problems = []
+    for database in databases_of(programs, path):
+        with tempfile.TemporaryDirectory() as name:
+            result = programs.source(pathlib.Path(name), database)
+        actual = (result.returncode, result.stdout, result.stderr)
+        for part, want, got in zip(("status", "output", "message"), expected, actual):
+            if want != got:
+                problems.append(f"{part}:\n  expected {want!r}\n  actual   {got!r}")
+    return problems
+
+
+def names():
+    """All cases and properties."""
+    suffixes = (".expect", ".error")
+    return [*sorted(path.stem for path in CASES.iterdir() if path.suffix in suffixes), *PROPERTIES]
+
+
+def main():
+    """Run the named ones, or all, and print the count; without programs, print the names."""
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--cdgen", type=pathlib.Path)
+    parser.add_argument("--cdef", type=pathlib.Path)
+    parser.add_argument("names", nargs="*")
+    options = parser.parse_args()
+    if options.cdgen is None or options.cdef is None:
+        print("\n".join(names()))
+        return 0
+    options.cdgen, options.cdef = options.cdgen.resolve(), options.cdef.resolve()
+    programs = Programs(options)
+    failed = 0
+    for name in options.names or names():
+        problems = PROPERTIES[name](programs) if name in PROPERTIES else check_case(programs, CASES / f"{name}.x")
+        failed += bool(problems)
+        if problems:
+            print(f"FAIL {name}", *problems, sep="\n    ")
+    print(f"{len(options.names or names()) - failed} passed, {failed} failed")
+    return 1 if failed else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())

@@ -24,6 +24,7 @@ TEST(AttributeLine, ValueIsWhatFollowsTheFirstEqualsSign) {
         {"\tName=a\"\"", "a\"\""},     {"\tName=\"abc\"", "abc"},   {"\tName= \t\"abc\"", "abc"},
         {"\tName=\" abc \"", " abc "}, {"\tName=\"a\"b\"", "a\"b"}, {"\tName=\"a\\b\"", "a\\b"},
         {"\tName=\"a=b\"", "a=b"},     {"\tName=\"\"\"", "\""},     {"\tName=\xff", "\xff"},
+        {"\tName=abc\r", "abc\r"},
     };
     for (const auto &[line, value] : rows) {
         opened c;

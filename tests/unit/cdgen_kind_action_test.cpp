@@ -63,6 +63,8 @@ TEST(Action, NeedsAClass) {
             opened c;
             c.cx.cb_rsrc_class.rc_cb_ID = 0;
             EXPECT_EQ(ending_of([&] { step(c.cx); }), (ending{"No class for class action", LINE, 1}));
+            compilation nothing_open;
+            EXPECT_EQ(nothing_open.reading(kind.name()), (ending{"No class for class action", 1, 1}));
         }
 }
 
@@ -182,11 +184,10 @@ TEST(Variety, RangesStandInTheirOrder) {
 }
 
 TEST(Variety, NeedsOneComma) {
-    const std::pair<const char *, const char *> rows[] = {{"VarietyRange=1", "Incorrect variety format"},
-                                                          {"VarietyRange=1;2", "Incorrect variety format"},
-                                                          {"VarietyRange=1,2,3", "Too many varieties"},
-                                                          {"VarietyRange=1,2,", "Too many varieties"},
-                                                          {"VarietyRange=,,", "Too many varieties"}};
+    const std::pair<const char *, const char *> rows[] = {
+        {"VarietyRange=1", "Incorrect variety format"}, {"VarietyRange=1;2", "Incorrect variety format"},
+        {"VarietyRange=1,2,3", "Too many varieties"},   {"VarietyRange=1,2,", "Too many varieties"},
+        {"VarietyRange=1,2 x,3", "Too many varieties"}, {"VarietyRange=,,", "Too many varieties"}};
     for (stanza_id kind : {SC_PERSISTENT_RESOURCE_ATTRIBUTE, SC_DYNAMIC_CLASS_ATTRIBUTE, SC_CLASS_ACTION})
         for (auto [line, message] : rows) {
             opened c;

@@ -312,9 +312,10 @@ TEST(Run, OfNoActionBelongsToNothing) {
 }
 
 TEST(Run, OfTheClassLeavesTheAttributeBeforeItAlone) {
-    for (std::string between : {std::string(), element("PAttrSDDefinition", 0, "Int32")}) {
+    for (const std::string &between : {std::string(), element("PAttrSDDefinition", 0, "Int32")}) {
         compilation c;
-        c.read(CLASS + pattr(P, "SD") + between);
+        c.read(CLASS + pattr(P, "SD"));
+        c.read(between);
         c.read(element("OnlineSDDefinition", 0, "Int32") + stanza("ResourceClass"));
         EXPECT_EQ(c.elements_at(c.cx.cb_rsrc_class.u_rc_online_input).size(), 1U);
         EXPECT_EQ(is_absent(c.cx.cb_rsrc_pattr.u_ra_sd), between.empty());

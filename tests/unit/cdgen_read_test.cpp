@@ -29,6 +29,11 @@ TEST(Reader, LineEndsAtItsCommentAndLosesWhatTrails) {
         {"X/y", "X/y"},
         {"X/", "X/"},
         {"/X", "/X"},
+        {"/", "/"}, /* text, even alone */
+        {"/ # y", "/"},
+        {"\"/\"", "\"/\""},
+        {"\"//\"", "\"//\""},
+        {"\"/*", "\"/*"},
         {"X/#y", "X/"},
         {"X/ /y", "X/ /y"},
         {"X///y", "X"},
@@ -102,11 +107,11 @@ TEST(Reader, LongValueIsCutWhereItsReadEnds) {
     EXPECT_EQ(strings + c.cx.cb_rsrc_cmmap.u_rcm_msg_file.offset[0], fits);
 }
 
-/* The source comes in pieces that know nothing of lines. */
+/* The source comes in pieces that know nothing of lines, nor of comments and quotes. */
 TEST(Reader, LineMayStandAcrossPiecesOfTheFile) {
-    for (size_t blank = 65536 - 40; blank <= 65536; ++blank) {
+    for (size_t blank = 65536 - 60; blank <= 65536; ++blank) {
         compilation c;
-        c.read(std::string(blank, '\n') + "ControlDefinition\n\tFileVersion=1.2.3.4\n");
+        c.read(std::string(blank, '\n') + "ControlDefinition # X\n\tFileVersion=\"1.2.3.4\" // Y\n");
         ASSERT_EQ(c.cx.cb_rsrc_class.rc_version, 0x01020304U) << blank;
         ASSERT_EQ(c.cx.linenum, static_cast<int>(blank) + 2);
     }

@@ -164,6 +164,51 @@ TEST_F(Tables, MemoryIsTakenInEverLargerSteps) {
     EXPECT_LT(steps, 30U);
 }
 
+TEST_F(Tables, RestartAsIfTheyWereNew) {
+    tbl t(32, "Before");
+    t.restart("Unused"); /* without a block yet */
+    memset(alloc_tble(cx, &t, 100), 0xEE, 100);
+    size_t held = t.tbl_capacity;
+    for (const char *name : {"Again", "Records"}) {
+        t.restart(name);
+        EXPECT_EQ(t.used() + t.tbl_size, 0U);
+    }
+    EXPECT_EQ(reserve(t, 8), 0U);
+    EXPECT_STREQ(t.tbl_name, "Records");
+    EXPECT_EQ(t.tbl_size, 32U);
+    EXPECT_EQ(t.tbl_prev_base, t.tbl_base);
+    EXPECT_EQ(reserve(t, 90), 8U);
+    EXPECT_EQ(t.tbl_size, 128U);
+    EXPECT_EQ(t.tbl_capacity, held);
+    EXPECT_EQ(contents(t), std::string(98, '\0'));
+    expect_sound(t);
+}
+
+TEST_F(Tables, TrimmedOnesHoldWhatIsUsedAndGrowAgain) {
+    tbl t(32, "Records");
+    add_to_tbl(cx, &t, "some text", 10);
+    trim_tbl(&t);
+    EXPECT_EQ(contents(t), bytes().text("some text").fill(7).all);
+    EXPECT_EQ(t.tbl_size, 16U);
+    EXPECT_EQ(t.tbl_capacity, 16U);
+    EXPECT_EQ(t.tbl_end, t.tbl_next);
+    EXPECT_EQ(add_to_tbl(cx, &t, "more", 5), 16U);
+    EXPECT_EQ(t.tbl_size, 48U);
+    EXPECT_EQ(contents(t), bytes().text("some text").fill(7).text("more").fill(4).all);
+    EXPECT_TRUE(all_zero(t.tbl_next, t.tbl_end));
+}
+
+TEST_F(Tables, TrimmingLeavesEmptyOnesAlone) {
+    trim_tbl(nullptr);
+    tbl unused(32, "Records"), empty(32, "Records");
+    trim_tbl(&unused);
+    EXPECT_EQ(unused.tbl_base, nullptr);
+    reserve(empty, 0);
+    trim_tbl(&empty);
+    EXPECT_EQ(empty.tbl_size, 32U);
+    expect_sound(empty);
+}
+
 /* ---- Traces ---------------------------------------------------------------------------------------------------- */
 
 std::string shown(const char *what, int bytes) {
@@ -450,50 +495,6 @@ TEST_F(Tables, VariableIdsHaveTheirUnit) {
     cmplt_var_class_tbl(cx);
     bld_var_id_tbls(cx);
     EXPECT_EQ(unit_of(cx.tables.back()), (unit{"VariableIDs", 64}));
-}
-
-/* ---- Pools of texts -------------------------------------------------------------------------------------------- */
-
-class Pools : public Tables {
-protected:
-    text_pool pool;
-};
-
-TEST_F(Pools, GiveZeroedBytesAlignedForAnyValue) {
-    for (int round = 0; round < 2; ++round, pool.clear())
-        for (size_t n : {1U, 3U, 8U, 13U, 1000U, 1024U, 1025U, 5000U, 7U}) {
-            char *taken = pool.take(n);
-            EXPECT_EQ(reinterpret_cast<std::uintptr_t>(taken) % alignof(vx_value_t), 0U) << n;
-            EXPECT_TRUE(all_zero(taken, taken + n)) << n;
-            memset(taken, 0xEE, n);
-        }
-}
-
-TEST_F(Pools, KeepWhatIsTakenUntilTheyAreCleared) {
-    std::vector<char *> all;
-    for (unsigned char i = 0; i < 200; ++i) {
-        all.push_back(pool.take(i * 20U + 1));
-        memset(all.back(), i, i * 20U + 1);
-    }
-    for (unsigned char i = 0; i < 200; ++i)
-        EXPECT_EQ(bytes_at(all[i], i * 20U + 1), bytes().fill(i * 20U + 1, i).all);
-}
-
-TEST_F(Pools, UseTheLatestChunkAgain) {
-    pool.clear(); /* nothing to give back */
-    char *small = pool.take(8);
-    pool.clear();
-    EXPECT_EQ(pool.take(8), small);
-    char *large = pool.take(5000);
-    pool.clear();
-    EXPECT_EQ(pool.take(8), large);
-    EXPECT_EQ(pool.take(4992), large + 8); /* all of its room */
-}
-
-TEST_F(Pools, SayWhenThereIsNoMemory) {
-    char *taken = pool.take(8);
-    EXPECT_EQ(pool.take(ABSURD), nullptr);
-    EXPECT_EQ(pool.take(8), taken + 8); /* and go on */
 }
 
 } // namespace

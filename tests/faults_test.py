@@ -1,0 +1,491 @@
+"""Faults of the system: what cdgen does when files fail it.
+
+Every case is a function below, named for what it shows.  Whatever happens, the
+program ends with a status of its own, never by a signal; and a fault before
+the output is opened leaves the output as it was.
+
+Run as root, cases about permissions give the program another user's.  A case
+that the machine does not allow (mounting) exits with 77 and says why.
+"""
+
+import errno
+import fcntl
+import os
+import pathlib
+import re
+import resource
+import shlex
+import shutil
+import signal
+import socket
+import stat
+import subprocess
+import sys
+import termios
+
+import golden
+from cases import ATTRIBUTE, BEFORE, BLOCK, HEAD, OUT, SKIPPED, SOURCE, TIMEOUT, Cases, Skip
+from cases import attributes, check, expect, limit, only_zeros
+
+NOBODY = 65534
+
+case = Cases()
+
+
+def as_nobody():
+    """In the child: another user, if this one is root."""
+    if os.geteuid() == 0:
+        os.setgroups([])
+        os.setgid(NOBODY)
+        os.setuid(NOBODY)
+
+
+def of_errno(number):
+    """The system's words, as LC_ALL=C has them."""
+    return os.strerror(number).encode()
+
+
+# ---- The source --------------------------------------------------------------
+
+
+def cannot_open(world, source, number, **more):
+    """The source does not open: the system's words and number, and the output as it was."""
+    world.write(OUT, BEFORE)
+    expect(world.run(source, OUT, **more), number, os.fsencode(source) + b": cannot open because: " + of_errno(number) + b"\n")
+    check(world.read() == BEFORE, "the output was touched")
+
+
+@case
+def source_unreadable(world):
+    """Nobody may read it."""
+    os.chmod(world.path(SOURCE), 0)
+    cannot_open(world, SOURCE, errno.EACCES, preexec_fn=as_nobody)
+
+
+@case
+def source_directory_unreadable(world):
+    """Nobody may look into its directory."""
+    world.path("closed").mkdir(mode=0)
+    cannot_open(world, "closed/" + SOURCE, errno.EACCES, preexec_fn=as_nobody)
+
+
+@case
+def source_below_a_file(world):
+    """Its directory is a file."""
+    cannot_open(world, SOURCE + "/more", errno.ENOTDIR)
+
+
+@case
+def source_behind_a_loop_of_links(world):
+    """A symbolic link that leads to itself."""
+    world.path("loop").symlink_to("loop")
+    cannot_open(world, "loop", errno.ELOOP)
+
+
+@case
+def source_name_too_long(world):
+    """No file can be called so."""
+    cannot_open(world, "x" * 5000, errno.ENAMETOOLONG)
+
+
+@case
+def source_is_a_socket(world):
+    """Nothing that can be opened."""
+    with socket.socket(socket.AF_UNIX) as listener:
+        here = os.getcwd()
+        os.chdir(world.directory)
+        listener.bind("socket")
+        os.chdir(here)
+        cannot_open(world, "socket", errno.ENXIO)
+
+
+def needs_no_descriptors(world):
+    """Skips what shared libraries, which have to be opened, keep from starting."""
+    usage = world.run("-n", preexec_fn=limit(resource.RLIMIT_NOFILE, 3)).stderr
+    if not usage.startswith(b"Usage: "):
+        raise Skip("the program needs descriptors to start: it is not static")
+
+
+@case
+def source_when_no_descriptor_is_free(world):
+    """The three standard streams are all that may be open."""
+    needs_no_descriptors(world)
+    cannot_open(world, SOURCE, errno.EMFILE, preexec_fn=limit(resource.RLIMIT_NOFILE, 3))
+
+
+@case
+def source_when_only_a_standard_descriptor_is_free(world):
+    """A standard stream's place is not taken for the source."""
+    needs_no_descriptors(world)
+    script = f"exec 0<&- 3>&1; ulimit -n 4; exec ./cdgen {SOURCE} {OUT}"
+    result = subprocess.run(["sh", "-c", script], capture_output=True, timeout=TIMEOUT, **world.options())
+    expect(result, errno.EMFILE, os.fsencode(SOURCE) + b": cannot open because: " + of_errno(errno.EMFILE) + b"\n")
+
+
+@case
+def two_free_descriptors_are_enough(world):
+    """One for the source, one for the output."""
+    good = world.good()
+    expect(world.run(preexec_fn=limit(resource.RLIMIT_NOFILE, 5)), 0)
+    check(world.read() == good, "another database")
+
+
+@case
+def source_cannot_be_read(world):
+    """It opens, but reading fails."""
+    world.write(OUT, BEFORE)
+    message = b"/proc/self/mem: cannot read because: " + of_errno(errno.EIO) + b"\n"
+    expect(world.run("/proc/self/mem", OUT), errno.EIO, message)
+    check(world.read() == BEFORE, "the output was touched")
+
+
+@case
+def source_cannot_be_read_n(world):
+    """The same without a newline."""
+    expect(world.run("-n", "/proc/self/mem", OUT), errno.EIO, b"/proc/self/mem: cannot read because: " + of_errno(errno.EIO))
+
+
+@case
+def source_is_a_directory(world):
+    """A directory opens, but cannot be read."""
+    expect(world.run(".", OUT), errno.EISDIR, b".: cannot read because: " + of_errno(errno.EISDIR) + b"\n")
+    check(not world.path(OUT).exists(), "there is an output")
+
+
+@case
+def source_is_the_null_device(world):
+    """Nothing in it."""
+    expect(world.run("/dev/null", OUT), 1, b"No classes defined\n")
+
+
+def through_pipe(world, feed):
+    """The run of a source that is a named pipe, which feed(descriptor, process) fills."""
+    os.mkfifo(world.path("pipe"))
+    process = world.start("pipe", OUT)
+    descriptor = os.open(world.path("pipe"), os.O_WRONLY)
+    feed(descriptor, process)
+    os.close(descriptor)
+    stdout, stderr = process.communicate(timeout=TIMEOUT)
+    return subprocess.CompletedProcess((), process.returncode, stdout, stderr)
+
+
+@case
+def source_is_a_pipe_that_closes_at_once(world):
+    """Nothing comes."""
+    expect(through_pipe(world, lambda descriptor, process: None), 1, b"No classes defined\n")
+    check(not world.path(OUT).exists(), "there is an output")
+
+
+@case
+def source_is_a_pipe_that_closes_too_early(world):
+    """Half of it comes, up to the middle of a line."""
+    half = HEAD[: HEAD.index(b"\tMessageCatalog") - 2]
+    good = world.good(half)
+    expect(through_pipe(world, lambda descriptor, process: os.write(descriptor, half)), 0)
+    check(world.read() == good, "not what the same half in a file gives")
+
+
+@case
+def source_comes_byte_by_byte(world):
+    """Reads that return less than was asked for."""
+    good = world.good()
+
+    def feed(descriptor, _):
+        for byte in HEAD:
+            os.write(descriptor, bytes([byte]))
+
+    expect(through_pipe(world, feed), 0)
+    check(world.read() == good, "another database")
+
+
+@case
+def source_vanishes_while_the_program_sleeps(world):
+    """Stopped and continued in the middle of a pipe that has lost its name."""
+    good = world.good()
+
+    def feed(descriptor, process):
+        os.write(descriptor, HEAD[:50])
+        process.send_signal(signal.SIGSTOP)
+        os.unlink(world.path("pipe"))
+        os.write(descriptor, HEAD[50:])
+        process.send_signal(signal.SIGCONT)
+
+    expect(through_pipe(world, feed), 0)
+    check(world.read() == good, "another database")
+
+
+def while_read(world, source, change):
+    """Changes the source while the program reads it, and returns status and messages.
+
+    The trace goes to a pipe that is full long before the source is read to
+    its end: when there is something in the pipe, the program is in the middle.
+    """
+    world.write(SOURCE, source)
+    process = world.start("-d", "2", SOURCE, OUT)
+    waiting = bytearray(4)
+    while int.from_bytes(waiting, sys.byteorder) == 0 and process.poll() is None:
+        fcntl.ioctl(process.stdout, termios.FIONREAD, waiting)
+    check(process.poll() is None, "over before the change")
+    change(world.path(SOURCE))
+    _, stderr = process.communicate(timeout=TIMEOUT)
+    return process.returncode, stderr
+
+
+@case
+def source_deleted_while_read(world):
+    """A file lives on while it is open."""
+    source = HEAD + attributes(5000)
+    good = world.good(source)
+    check(while_read(world, source, os.unlink) == (0, b""), "it does not compile")
+    check(world.read() == good, "another database")
+
+
+@case
+def source_grows_while_read(world):
+    """What comes in time belongs to the source."""
+    source = HEAD + attributes(5000)
+    more = ATTRIBUTE % (9999, 9999, 9999)
+    good = world.good(source + more)
+
+    def grow(path):
+        with open(path, "ab") as file:
+            file.write(more)
+
+    check(while_read(world, source, grow) == (0, b""), "it does not compile")
+    check(world.read() == good, "another database")
+
+
+@case
+def source_shortened_while_read(world):
+    """What is read of it decides; in the middle of an attribute it is refused."""
+    world.write(OUT, BEFORE)
+    status, stderr = while_read(world, HEAD + attributes(5000), lambda path: os.truncate(path, 0))
+    if status == 0:
+        check(stderr == b"" and world.read() != BEFORE, "no message and no database")
+    else:
+        check(status == 1 and re.fullmatch(rb"\d+: [^\n]+\n", stderr), "status", status, stderr)
+        check(world.read() == BEFORE, "the output was touched")
+
+
+# ---- The output --------------------------------------------------------------
+
+
+def cannot_create(world, out, number, **more):
+    """The output cannot be created or filled."""
+    expect(world.run(SOURCE, out, **more), 1, b"Cannot create CDB file: " + of_errno(number) + b"\n")
+
+
+@case
+def output_directory_read_only(world):
+    """Nobody may create files there."""
+    world.path("closed").mkdir(mode=0o555)
+    cannot_create(world, "closed/" + OUT, errno.EACCES, preexec_fn=as_nobody)
+    check(not list(world.path("closed").iterdir()), "something was created")
+
+
+@case
+def output_directory_missing(world):
+    """There is no such directory."""
+    cannot_create(world, "missing/" + OUT, errno.ENOENT)
+
+
+@case
+def output_below_a_file(world):
+    """Its directory is a file."""
+    cannot_create(world, SOURCE + "/" + OUT, errno.ENOTDIR)
+
+
+@case
+def output_name_empty(world):
+    """No name at all."""
+    cannot_create(world, "", errno.ENOENT)
+
+
+@case
+def output_name_too_long(world):
+    """No file can be called so."""
+    cannot_create(world, "x" * 300, errno.ENAMETOOLONG)
+
+
+@case
+def output_read_only(world):
+    """A database that nobody may change stays."""
+    world.write(OUT, BEFORE)
+    os.chmod(world.path(OUT), 0o444)
+    cannot_create(world, OUT, errno.EACCES, preexec_fn=as_nobody)
+    check(world.read() == BEFORE, "the output was touched")
+
+
+@case
+def output_is_a_directory(world):
+    """A directory is no output, and stays."""
+    world.path(OUT).mkdir()
+    cannot_create(world, OUT, errno.EISDIR)
+    check(world.path(OUT).is_dir(), "the directory is gone")
+
+
+@case
+def output_behind_a_loop_of_links(world):
+    """A symbolic link that leads to itself."""
+    world.path(OUT).symlink_to(OUT)
+    cannot_create(world, OUT, errno.ELOOP)
+
+
+@case
+def output_is_a_full_device(world):
+    """Nothing can be written."""
+    cannot_create(world, "/dev/full", errno.ENOSPC)
+
+
+def cannot_map(world, out):
+    """The output has no contents that could be mapped."""
+    result = world.run(SOURCE, out)
+    check(result.returncode == 1 and result.stdout == b"", "status", result.returncode, result.stdout)
+    check(re.fullmatch(rb"Cannot map CDB file: [^\n]+\n", result.stderr), result.stderr)
+
+
+@case
+def output_is_a_pipe(world):
+    """It must not wait for a reader; the pipe stays."""
+    os.mkfifo(world.path(OUT))
+    cannot_map(world, OUT)
+    check(stat.S_ISFIFO(os.stat(world.path(OUT)).st_mode), "the pipe is gone")
+
+
+@case
+def output_is_the_null_device(world):
+    """The device stays."""
+    cannot_map(world, "/dev/null")
+    check(stat.S_ISCHR(os.stat("/dev/null").st_mode), "the device is gone")
+
+
+@case
+def output_is_a_link(world):
+    """A symbolic link is followed, and stays."""
+    good = world.good()
+    world.write("target", BEFORE * 1000)
+    world.path(OUT).symlink_to("target")
+    expect(world.run(), 0)
+    check(world.path(OUT).is_symlink() and world.read("target") == good, "not written through the link")
+
+
+@case
+def output_is_a_link_to_nothing(world):
+    """What it leads to is created."""
+    good = world.good()
+    world.path(OUT).symlink_to("target")
+    expect(world.run(), 0)
+    check(world.path(OUT).is_symlink() and world.read("target") == good, "not written through the link")
+
+
+@case
+def output_is_a_link_to_the_source(world):
+    """The source is never overwritten."""
+    world.path(OUT).symlink_to(SOURCE)
+    expect(world.run(), 1, b"Cannot create CDB file: it is the source file\n")
+    check(world.read(SOURCE) == HEAD, "the source was touched")
+
+
+@case
+def new_output_has_its_mode(world):
+    """Mode 0644 but for the umask."""
+    expect(world.run(preexec_fn=lambda: os.umask(0o026)), 0)
+    check(stat.S_IMODE(os.stat(world.path(OUT)).st_mode) == 0o640, oct(os.stat(world.path(OUT)).st_mode))
+
+
+@case
+def replaced_output_keeps_its_mode_and_links(world):
+    """It is written in place."""
+    good = world.good()
+    world.write(OUT, BEFORE)
+    os.chmod(world.path(OUT), 0o600)
+    os.link(world.path(OUT), world.path("other"))
+    expect(world.run(), 0)
+    check(world.read("other") == good, "another file")
+    check(stat.S_IMODE(os.stat(world.path(OUT)).st_mode) == 0o600, "another mode")
+
+
+@case
+def file_size_limit(world):
+    """A file that may not grow: an error of the call, no signal; the least limit that is enough."""
+    good = world.good(HEAD + attributes(50))
+    gross = -(-len(good) // BLOCK) * BLOCK
+    check(gross > 4 * BLOCK, "the database is too small for the case")
+    for size in (0, 1, BLOCK - 1, BLOCK, BLOCK + 1, gross - BLOCK, gross - 1):
+        cannot_create(world, OUT, errno.EFBIG, preexec_fn=limit(resource.RLIMIT_FSIZE, size))
+        only_zeros(world)
+    expect(world.run(preexec_fn=limit(resource.RLIMIT_FSIZE, gross)), 0)
+    check(world.read() == good, "another database")
+
+
+@case
+def file_system_full(world):
+    """A file system of 16 KB and a database of more."""
+    world.write(SOURCE, HEAD + attributes(500))
+    world.path("small").mkdir()
+    script = 'mount -t tmpfs -o size=16k none small || exit 77; "$@"; status=$?; tr -d "\\0" <small/out.cdef; exit $status'
+    user = [] if os.geteuid() == 0 else ["-r"]
+    command = ["unshare", *user, "-m", "sh", "-c", script, "sh", world.program, SOURCE, "small/" + OUT]
+    if shutil.which("unshare") is None:
+        raise Skip("no unshare(1) here")
+    result = subprocess.run(command, capture_output=True, timeout=TIMEOUT, **world.options())
+    if result.returncode == SKIPPED or b"unshare:" in result.stderr:
+        raise Skip("mounting is not allowed here: " + result.stderr.decode())
+    expect(result, 1, b"Cannot create CDB file: " + of_errno(errno.ENOSPC) + b"\n")
+
+
+# ---- Mistakes in the source ----------------------------------------------------
+
+
+def untouched(world, area):
+    """Every golden case of an area whose source is at fault leaves a database as it was, to the inode and the time."""
+    count = 0
+    for path in golden.cases_of([pathlib.Path(__file__).parent / "golden" / area]):
+        expected = golden.Case(path)
+        if expected.status == 0 or "operands" in expected.keys or expected.setup:
+            continue
+        world.write(expected.source.name, expected.source.read_bytes())
+        world.path(expected.out).parent.mkdir(parents=True, exist_ok=True)
+        world.write(expected.out, BEFORE)
+        before = os.stat(world.path(expected.out))
+        result = world.run(*shlex.split(expected.keys.get("args", "")), expected.source.name, expected.out)
+        after = os.stat(world.path(expected.out))
+        same = (before.st_ino, before.st_mtime_ns) == (after.st_ino, after.st_mtime_ns)
+        check(result.returncode == expected.status, expected.name, "status", result.returncode)
+        check(same and world.read(expected.out) == BEFORE, expected.name, "touched the output")
+        count += 1
+    check(count > 0, "no cases")
+
+
+@case
+def mistakes_of_lines_leave_the_output(world):
+    """Golden cases of the reader."""
+    untouched(world, "reader")
+
+
+@case
+def mistakes_of_attributes_leave_the_output(world):
+    """Golden cases of the parser."""
+    untouched(world, "parser")
+
+
+@case
+def mistakes_of_values_leave_the_output(world):
+    """Golden cases of the handlers."""
+    untouched(world, "handlers")
+
+
+@case
+def mistakes_of_stanzas_leave_the_output(world):
+    """Golden cases of the assembly."""
+    untouched(world, "assembly")
+
+
+@case
+def settled_mistakes_leave_the_output(world):
+    """Golden cases of what was settled."""
+    untouched(world, "settled")
+
+
+if __name__ == "__main__":
+    sys.exit(case.main(__doc__))

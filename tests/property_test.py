@@ -1,0 +1,376 @@
+"""Properties that hold for every source, tried on generated ones.
+
+For a source that is right: it compiles, silently; the database says what the
+source says; its size and checksum are right; it comes out the same the second
+time, in another directory, under other settings of language and time zone, and
+with options n and d; option s gives what tests/reverse_cdb.py makes of it, and
+turning that once more gives the first again; cdef verify finds nothing wrong
+with either; and the source that cdef source writes gives the same database.
+
+For a mutation: the status is 0 or 1.  If 1, there is a message and no output;
+if 0, no message, and the database keeps all that was said above but for what
+the source means, which nobody knows.
+
+A group is a test of its own.  Everything follows from the seeds, so that a
+failure names the seed that shows it:
+generate_sources.py DIRECTORY 1 SEED writes its source again.
+"""
+
+import argparse
+import functools
+import operator
+import os
+import pathlib
+import struct
+import subprocess
+import sys
+import tempfile
+
+import generate_sources
+import reverse_cdb
+
+GROUPS = 40
+CASES = 20000
+MUTATIONS = 2  # of each source
+SAMPLE = 100  # one of so many is compiled by the program itself too
+TIMEOUT = 1800
+SHARED_MEMORY = pathlib.Path("/dev/shm")
+MARK = "<" if sys.byteorder == "little" else ">"
+ELSEWHERE = {"LC_ALL": "de_DE.UTF-8", "LANG": "tr_TR.UTF-8", "TZ": "Asia/Kathmandu", "POSIXLY_CORRECT": ""}
+
+# A section's type; of each kind of record its table's field, its count's, its size, and its name's, ID's and type's fields.
+CLASS, MANAGER, MAP, GROUP = 5, 3, 6, 4
+TABLES = {
+    "PersistentClassAttribute": (24, 168, 72, 8, 32, 36),
+    "DynamicClassAttribute": (32, 170, 136, 8, 120, 104),
+    "PersistentResourceAttribute": (40, 172, 72, 8, 32, 36),
+    "DynamicResourceAttribute": (48, 174, 136, 8, 120, 104),
+    "ClassAction": (96, 176, 56, 24, 4, None),
+    "ResourceAction": (104, 178, 56, 24, 4, None),
+}
+
+
+class Problem(Exception):
+    """A property that does not hold."""
+
+
+def require(holds, *what):
+    """Raise the problem unless the condition holds."""
+    if not holds:
+        raise Problem(" ".join(map(str, what)))
+
+
+# ---- One database --------------------------------------------------------------
+
+
+def is_whole(image, mark):
+    """Size and checksum are right, in a byte order."""
+    require(len(image) >= 80 and len(image) % 4 == 0, "size", len(image))
+    words = struct.unpack(f"{mark}{len(image) // 4}I", image)
+    require(words[0] == len(image) - 4, "length", words[0], "in a file of", len(image))
+    require(functools.reduce(operator.xor, words[2:], words[0]) == words[1], "wrong checksum")
+
+
+class Reading:
+    """What of a database the truth speaks of."""
+
+    def __init__(self, image):
+        self.image = image
+        self.sections = [self.get(80 + 16 * i, "3I") for i in range(self.get(24, "I")[0])]
+        self.at = self.of_type(CLASS)[0]
+        self.strings = self.at + self.get(self.at + 160, "I")[0]
+
+    def get(self, at, form):
+        """Numbers at an offset."""
+        return struct.unpack_from(MARK + form, self.image, at)
+
+    def of_type(self, kind):
+        """Where the sections of a type begin."""
+        return [at for found, at, _ in self.sections if found == kind]
+
+    def text(self, strings, field):
+        """The text that a field refers to."""
+        at = strings + self.get(field, "I")[0]
+        return self.image[at : self.image.index(b"\0", at)]
+
+    def records(self, kind):
+        """Names, IDs and types of a kind of record."""
+        table, count, size, name, identifier, data_type = TABLES[kind]
+        first = self.at + self.get(self.at + table, "I")[0]
+        for at in range(first, first + size * self.get(self.at + count, "H")[0], size):
+            record = {"name": self.text(self.strings, at + name), "id": self.get(at + identifier, "i")[0]}
+            if data_type is not None:
+                record["type"] = self.get(at + data_type, "I")[0]
+            yield record
+
+
+def same(what, found, expected):
+    """Two things that have to be equal."""
+    require(found == expected, what, "is", found, "and not", expected)
+
+
+def says_the_truth(image, truth, out):
+    """The database holds what the source says."""
+    reading = Reading(image)
+    same("class", reading.text(reading.strings, reading.at + 8), truth.name or out.partition(".cdef")[0].encode())
+    same("version", reading.get(reading.at + 216, "I")[0], truth.version)
+    for kind, records in truth.records.items():
+        same(kind, list(reading.records(kind)), records)
+    same("variable classes", [reading.text(at + 40, at + 8) for at in reading.of_type(GROUP)], truth.groups)
+    same("managers", [reading.text(at + 24, at + 8) for at in reading.of_type(MANAGER)], [truth.manager])
+    same("maps", [reading.text(at + 60, at + 8) for at in reading.of_type(MAP)], [truth.catalog])
+
+
+def may_misplace_a_range(text):
+    """A class attribute's range may have landed in a resource attribute; that it leads nowhere no image tells."""
+    kind, resource_open = b"", False
+    for line in text.split(b"\n"):
+        word = line.split(b" ")[0].split(b"\t")[0]
+        if word.decode("latin-1") in generate_sources.STANZAS:
+            kind = word
+            resource_open = kind == b"DynamicResourceAttribute" or (resource_open and kind != b"ControlDefinition")
+        elif kind == b"DynamicClassAttribute" and resource_open and line.strip().startswith(b"Range="):
+            return True
+    return False
+
+
+def may_cut_attributes_short(text):
+    """A second class may have ended an attribute without valid values; that it has none no image tells either."""
+    return text.count(b"ControlDefinition") > 1
+
+
+# ---- A group of sources --------------------------------------------------------
+
+
+class Batch:
+    """Sources that are compiled together, each in several ways."""
+
+    def __init__(self, programs, directory):
+        self.programs = programs
+        self.directory = directory
+        self.sources = {}  # by name: the text
+        self.problems = []
+        for place in ("sources", "first", "second place/of another depth", "turned", "back", "alone"):
+            (directory / place).mkdir(parents=True)
+
+    def add(self, name, text):
+        """A source."""
+        self.sources[name] = text
+        (self.directory / "sources" / name).write_bytes(text)
+
+    def path(self, name, place="sources"):
+        """A source or a database."""
+        return self.directory / place / (name if place == "sources" else name + ".cdef")
+
+    def read(self, name, place):
+        """A database, or None."""
+        try:
+            return self.path(name, place).read_bytes()
+        except FileNotFoundError:
+            return None
+
+    def environment(self, more):
+        """Variables of the programs."""
+        return {**os.environ, "LC_ALL": "C", "VX_CDB_FORCE_EMPTY_TIMESTAMP": "", **more}
+
+    def compile(self, place, names, options=lambda name: (), sources=None, more=None):
+        """Compiles sources in a directory; status and message by name."""
+        source = sources or self.path
+        jobs = ["\t".join((*options(name), str(source(name)), name + ".cdef")) for name in names]
+        result = subprocess.run(
+            [self.programs.compile_many], cwd=self.directory / place, env=self.environment(more or {}),
+            input="".join(job + "\n" for job in jobs).encode(), capture_output=True, timeout=TIMEOUT,
+        )
+        answers = [line.split("\t", 1) for line in result.stdout.decode("latin-1").split("\n")[:-1]]
+        if result.returncode != 0 or len(answers) != len(jobs):
+            culprit = jobs[len(answers)] if len(answers) < len(jobs) else "the end"
+            raise Problem(f"ended with {result.returncode} at {culprit}: {result.stderr}")
+        return {name: (int(status), message) for name, (status, message) in zip(names, answers)}
+
+    def holds(self, name, *check):
+        """Notes a problem of a source and goes on."""
+        try:
+            check[0](*check[1:])
+        except (Problem, struct.error, IndexError, ValueError) as problem:
+            self.problems.append(f"{name}: {problem!r}")
+
+    # -- properties --
+
+    def same_again(self, names):
+        """Elsewhere, under other settings, with options that change nothing of the database."""
+        level = lambda name: len(self.sources[name]) % 5
+        options = lambda name: ("-n", "-d", str(level(name)))
+        place = "second place/of another depth"
+        answers = self.compile(place, names, options, more=ELSEWHERE)
+        for name in names:
+            status, message = answers[name]
+            self.holds(name, require, status == 0, "status elsewhere", status, message)
+            self.holds(name, require, level(name) > 2 or message == "", "message elsewhere", message)
+            self.holds(name, require, self.read(name, place) == self.read(name, "first"), "another database elsewhere")
+
+    def turned(self, names):
+        """Option s, against the other statement of the reversal, both ways."""
+        answers = self.compile("turned", names, lambda name: ("-s",))
+        for name in names:
+            first, turned = self.read(name, "first"), self.read(name, "turned")
+            self.holds(name, same, "outcome with -s", answers[name], (0, ""))
+            self.holds(name, is_whole, turned, ">" if MARK == "<" else "<")
+            if may_misplace_a_range(self.sources[name]) or may_cut_attributes_short(self.sources[name]):
+                continue
+            self.holds(name, require, reverse_cdb.reverse(first) == turned, "not what reverse_cdb makes of it")
+            self.holds(name, require, reverse_cdb.reverse(turned) == first, "turned twice, another database")
+
+    def alone(self, names):
+        """The program itself, which starts afresh for each."""
+        for name in names:
+            command = [self.programs.cdgen, f"../sources/{name}", f"{name}.cdef"]
+            result = subprocess.run(
+                command, cwd=self.directory / "alone", env=self.environment(ELSEWHERE), capture_output=True, timeout=TIMEOUT
+            )
+            outcome = (result.returncode, result.stdout, result.stderr)
+            self.holds(name, same, "outcome of the program", outcome, (0, b"", b""))
+            self.holds(name, require, self.read(name, "alone") == self.read(name, "first"), "another database alone")
+
+    def cdef(self, *arguments):
+        """A run of cdef."""
+        return subprocess.run(
+            [self.programs.cdef, *arguments], cwd=self.directory, env=self.environment({}), capture_output=True, timeout=TIMEOUT
+        )
+
+    def sound(self, names):
+        """Verification finds no errors, in either order."""
+        if not names:
+            return
+        files = [str(self.path(name, place)) for name in names for place in ("first", "turned")]
+        result = self.cdef("verify", "-q", *files)
+        self.holds("cdef verify", same, "outcome", (result.returncode, result.stdout + result.stderr), (0, b""))
+
+    def back(self, names):
+        """The source that is made of a database gives the same database."""
+        script = 'for i; do "$CDEF" source "first/$i.cdef" >"back/$i" || echo "$i"; done'
+        environment = self.environment({"CDEF": str(self.programs.cdef)})
+        result = subprocess.run(
+            ["sh", "-c", script, "sh", *names], cwd=self.directory, env=environment, capture_output=True, timeout=TIMEOUT
+        )
+        self.holds("cdef source", same, "outcome", result.stdout + result.stderr, b"")
+        answers = self.compile("back", names, sources=lambda name: self.directory / "back" / name)
+        for name in names:
+            self.holds(name, same, "outcome of its own source", answers[name], (0, ""))
+            if answers[name][0] == 0 and self.read(name, "back") != self.read(name, "first"):
+                result = self.cdef("diff", self.path(name, "first"), self.path(name, "back"))
+                self.holds(name, same, "difference", (result.returncode, result.stdout + result.stderr), (0, b""))
+
+    def check(self, compiled):
+        """What holds for every database."""
+        for name in compiled:
+            self.holds(name, is_whole, self.read(name, "first"), MARK)
+        self.same_again(compiled)
+        self.turned(compiled)
+        self.alone(compiled[::SAMPLE])
+        if self.programs.cdef is not None:
+            self.sound(compiled)
+            self.back([name for name in compiled if not may_misplace_a_range(self.sources[name])])
+
+
+def check_mutation(batch, name, answer):
+    """A mutation compiles, or is refused properly."""
+    status, message = answer
+    batch.holds(name, require, status in (0, 1), "status", status)
+    batch.holds(name, require, (status == 0) == (message == ""), "status", status, "with the message", message)
+    batch.holds(name, require, (status == 0) == (batch.read(name, "first") is not None), "status", status, "and its file")
+
+
+def check_group(programs, seeds):
+    """All properties for the sources of some seeds and their mutations; the problems."""
+    memory = SHARED_MEMORY if os.access(SHARED_MEMORY, os.W_OK) else None
+    with tempfile.TemporaryDirectory(prefix="cdgen-property-", dir=memory) as directory:
+        batch = Batch(programs, pathlib.Path(directory))
+        truths, mutations = {}, []
+        for seed in seeds:
+            text, truths[str(seed)] = generate_sources.source(seed)
+            batch.add(str(seed), text)
+            for i in range(MUTATIONS):
+                mutations.append(f"{seed}-{i}")
+                batch.add(mutations[-1], generate_sources.mutation(f"{seed}-{i}", text))
+        try:
+            answers = batch.compile("first", [*truths, *mutations])
+            for name, truth in truths.items():
+                batch.holds(name, same, "outcome", answers[name], (0, ""))
+                if answers[name][0] == 0:
+                    batch.holds(name, says_the_truth, batch.read(name, "first"), truth, f"{name}.cdef")
+            for name in mutations:
+                check_mutation(batch, name, answers[name])
+            batch.check([name for name, (status, _) in answers.items() if status == 0])
+        except (Problem, subprocess.SubprocessError) as problem:
+            batch.problems.append(str(problem))
+        return batch.problems
+
+
+# ---- The generator ---------------------------------------------------------------
+
+
+def check_catalogue(programs, _):
+    """Whatever name the language has comes up in the first thousand sources."""
+    listed = subprocess.run([programs.list_names], capture_output=True, text=True, check=True).stdout.split("\n")
+    text = b"\n".join(generate_sources.source(seed)[0] for seed in range(1000)).decode("latin-1")
+    lines = [line.strip() for line in text.split("\n")]
+    starts = {line.partition("=")[0].partition(" ")[0].partition("\t")[0] for line in lines}
+    words = {word for line in lines for word in line.partition("=")[2].split(" ")[0].split("\t")[0].strip('"').split(",")}
+    problems = []
+    for what, *rest in (line.split() for line in listed if line):
+        name = rest[1] if what in ("attribute", "property") else rest[0]
+        refused = (what, name) == ("attribute", "DefaultValue") and "SDDefinition" in rest[0] or name == "SBS"
+        among = starts if what in ("stanza", "attribute") else words
+        if what != "field" and not refused and name not in among:
+            problems.append(f"{what} {' '.join(rest)} never comes up")
+    return problems
+
+
+def check_determined(_, seeds):
+    """A seed gives the same source each time, and another seed another."""
+    texts = [generate_sources.source(seed)[0] for seed in seeds]
+    again = [generate_sources.source(seed)[0] for seed in seeds]
+    problems = [] if texts == again else ["another source the second time"]
+    return problems if len(set(texts)) == len(texts) else [*problems, "two seeds have one source"]
+
+
+def names():
+    """All tests."""
+    return ["catalogue", "determined", *(f"sources-{group:02}" for group in range(GROUPS))]
+
+
+def run(name, options):
+    """The problems of one test."""
+    each = -(-options.cases // GROUPS)
+    if name == "catalogue":
+        return check_catalogue(options, None)
+    if name == "determined":
+        return check_determined(options, range(each))
+    group = int(name.rpartition("-")[2])
+    return check_group(options, range(options.first + group * each, options.first + (group + 1) * each))
+
+
+def main():
+    """Run the named tests, or all, and print the count; without programs, print the names."""
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    for program in ("cdgen", "cdef", "compile-many", "list-names"):
+        parser.add_argument(f"--{program}", type=lambda text: pathlib.Path(text).resolve())
+    parser.add_argument("--cases", type=int, default=CASES, help="how many sources all groups have together")
+    parser.add_argument("--first", type=int, default=0, help="the first seed")
+    parser.add_argument("names", nargs="*")
+    options = parser.parse_args()
+    if options.compile_many is None:
+        print("\n".join(names()))
+        return 0
+    failed = 0
+    for name in options.names or names():
+        problems = run(name, options)
+        failed += bool(problems)
+        if problems:
+            print(f"FAIL {name}", *problems[:10], f"{len(problems)} problems", sep="\n    ")
+    print(f"{len(options.names or names()) - failed} passed, {failed} failed")
+    return 1 if failed else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())

@@ -1,0 +1,84 @@
+/* image_fuzz: reads arbitrary bytes as a database. Whatever they say, verification ends, the regions tile the file, and
+ * the views read nothing outside of it; once it is sound, everything in it can be read to the end. */
+
+#include "fuzz.h"
+
+#include <algorithm>
+#include <memory>
+
+namespace {
+
+/* Bytes at their own end of memory, so that the first one behind them is seen, and at any alignment. */
+class copy_of {
+public:
+    copy_of(const std::uint8_t *data, std::size_t size, std::size_t off)
+        : memory(std::make_unique<std::byte[]>(size + off)), bytes(memory.get() + off, size) {
+        std::copy_n(reinterpret_cast<const std::byte *>(data), size, bytes.begin());
+    }
+
+private:
+    std::unique_ptr<std::byte[]> memory;
+
+public:
+    std::span<std::byte> bytes;
+};
+
+void put(std::span<std::byte> image, std::size_t at, std::uint32_t word, std::endian order) {
+    auto raw = std::bit_cast<std::array<std::byte, 4>>(word);
+    if (order != std::endian::native)
+        std::reverse(raw.begin(), raw.end());
+    std::copy(raw.begin(), raw.end(), image.begin() + static_cast<std::ptrdiff_t>(at));
+}
+
+/* Sets length and checksum right, which chance never does; without it hardly anything would be sound. */
+void make_whole(std::span<std::byte> image, std::endian order) {
+    cdb::bytes all(image, order);
+    auto length = static_cast<std::uint32_t>(image.size() - 4);
+    std::uint32_t sum = length;
+    for (std::size_t word = 0; word < (length - 4) / 4; ++word)
+        sum ^= all.number<std::uint32_t>(8 + 4 * word);
+    put(image, 0, length, order);
+    put(image, 4, sum, order);
+}
+
+void check_regions(const cdb::database &db) {
+    std::size_t end = 0;
+    for (const cdb::region &r : cdb::regions(db)) {
+        fuzz::require(r.offset == end && r.size > 0, "regions do not tile the file");
+        end += r.size;
+    }
+    fuzz::require(end == db.file().size(), "regions do not cover the file");
+}
+
+/* Unsound files are read too, which must be safe, if they are so small that all of it takes no time: lists may share
+ * their entries in them, and those others. */
+constexpr std::size_t UNSOUND_SIZE_MAX = 1000;
+
+std::vector<cdb::finding> verified(const cdb::database &db) {
+    std::vector<cdb::finding> findings = cdb::verify(db);
+    for (const cdb::finding &f : findings)
+        fuzz::require(!f.broken->code.empty() && f.offset <= db.file().size(), "a finding outside of the file");
+    return findings;
+}
+
+void look_through(const cdb::database &db) {
+    bool sound = cdb::is_sound(verified(db));
+    if (sound || db.file().size() <= UNSOUND_SIZE_MAX)
+        fuzz::read_all(db, sound);
+    check_regions(db);
+}
+
+} // namespace
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size) {
+    copy_of image(data, size, size % 8);
+    cdb::database db(image.bytes);
+    if (size < sizeof(orb_cdb_header_t)) {
+        look_through(db);
+        return 0;
+    }
+    verified(db);
+    make_whole(image.bytes, db.order());
+    look_through(cdb::database(image.bytes));
+    return 0;
+}

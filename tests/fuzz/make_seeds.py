@@ -1,0 +1,87 @@
+"""Write what the fuzz targets begin with: seeds and a dictionary.
+
+DIRECTORY/source gets the golden sources and generated ones, each behind a byte
+of options; DIRECTORY/image what cdgen makes of them, in both byte orders, and
+the images of tests/image; DIRECTORY/source.dict the words of the language, as
+the compiler's own catalogue has them.
+"""
+
+import argparse
+import os
+import pathlib
+import subprocess
+import sys
+
+TESTS = pathlib.Path(__file__).resolve().parent.parent
+sys.path.insert(0, str(TESTS))
+
+import generate_sources  # noqa: E402
+
+GENERATED = 50
+OPTIONS = (0x00, 0x08, 0x07, 0x0E, 0x10, 0x20)  # see source_fuzz.cpp
+MORE_WORDS = (
+    "0x", "-1", "0", "4294967296", "9223372036854775807", "18446744073709551616", "1e39", "1e-46", "nan", "inf", "0x1p-149",
+    ",", "1,2", '""', '"', "\\\\", "\\377", "//", "/*", "#", "SBS", "UNKNOWN", "\0", "\r\n", "1.2.3.4", "SDDefinition",
+)
+
+
+def sources():
+    """All texts that are worth beginning with."""
+    for path in sorted(TESTS.rglob("*.cdefsrc")):
+        yield path.read_bytes()
+    for seed in range(GENERATED):
+        yield generate_sources.source(seed)[0]
+
+
+def compile_source(cdgen, directory, text, name):
+    """Writes a source's databases, if it has any."""
+    source = directory / "text"
+    source.write_bytes(text)
+    for suffix, option in (("", []), ("-turned", ["-s"])):
+        out = directory / f"{name}{suffix}.cdef"
+        environment = {**os.environ, "VX_CDB_FORCE_EMPTY_TIMESTAMP": ""}
+        subprocess.run([cdgen, *option, source, out], env=environment, capture_output=True, check=False)
+    source.unlink()
+
+
+def escaped(word):
+    """A dictionary entry."""
+    text = "".join(c if c.isalnum() or c in "=,._-" else f"\\x{ord(c):02x}" for c in word)
+    return f'"{text}"\n'
+
+
+def words(list_names):
+    """Every word of the language, with what stands around it."""
+    listed = subprocess.run([list_names], capture_output=True, text=True, check=True).stdout
+    for line in listed.splitlines():
+        what, *rest = line.split()
+        if what == "stanza":
+            yield f"\n{rest[0]}\n"
+        elif what == "attribute":
+            yield f"\n\t{rest[1]}="
+        elif what in ("property", "type", "variable", "permission"):
+            yield rest[-1]
+    yield from MORE_WORDS
+
+
+def main():
+    """Write everything."""
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--cdgen", type=pathlib.Path, required=True)
+    parser.add_argument("--list-names", type=pathlib.Path, required=True)
+    parser.add_argument("directory", type=pathlib.Path)
+    options = parser.parse_args()
+    for name in ("source", "image"):
+        (options.directory / name).mkdir(parents=True, exist_ok=True)
+    for number, text in enumerate(sources()):
+        option = OPTIONS[number % len(OPTIONS)]
+        (options.directory / "source" / str(number)).write_bytes(bytes([option]) + text)
+        compile_source(options.cdgen.resolve(), options.directory / "image", text, number)
+    command = [sys.executable, "-B", TESTS / "image" / "make_images.py", "--out", options.directory / "image"]
+    subprocess.run(command, check=True)
+    dictionary = sorted({escaped(word) for word in words(options.list_names.resolve())})
+    (options.directory / "source.dict").write_text("".join(dictionary))
+
+
+if __name__ == "__main__":
+    main()

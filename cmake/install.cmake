@@ -43,5 +43,7 @@ configure_file(cmake/cdgen.pc.in cdgen.pc @ONLY)
 install(FILES "${CMAKE_CURRENT_BINARY_DIR}/cdgen.pc" DESTINATION "${CMAKE_INSTALL_LIBDIR}/pkgconfig")
 
 # For people.
+install(FILES man/cdgen.1 man/cdef.1 DESTINATION "${CMAKE_INSTALL_MANDIR}/man1")
+install(FILES man/cdefsrc.5 man/cdb.5 DESTINATION "${CMAKE_INSTALL_MANDIR}/man5")
 install(FILES README.md LICENSE DESTINATION "${CMAKE_INSTALL_DOCDIR}")
 install(DIRECTORY docs examples DESTINATION "${CMAKE_INSTALL_DOCDIR}")

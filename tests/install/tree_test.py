@@ -19,6 +19,10 @@ class Tree(Case):
         """Objects of another compiler's link-time optimisation could not be linked."""
         self.assertNotIn("gnu.lto", run("readelf", "--section-headers", "--wide", only("lib*/**/libcdb_view.a")))
 
+    def test_each_page_is_in_its_section(self):
+        pages = sorted(path.name for path in (tree() / "share/man").glob("man*/*"))
+        self.assertEqual(pages, ["cdb.5", "cdef.1", "cdefsrc.5", "cdgen.1"])
+
     def test_nothing_holds_the_prefix(self):
         prefix = str(tree().parent / "before").encode()
         for path in tree().rglob("*"):

@@ -4,7 +4,7 @@ import pathlib
 import re
 
 PROJECT = pathlib.Path(__file__).resolve().parents[1]
-DOCUMENTS = [PROJECT / "README.md", *sorted((PROJECT / "docs").glob("*.md"))]
+DOCUMENTS = sorted([*PROJECT.glob("*.md"), *(PROJECT / "docs").glob("*.md")])
 PAGES = sorted((PROJECT / "man").glob("*.[15]"))
 
 

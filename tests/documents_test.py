@@ -50,10 +50,23 @@ class Sources(unittest.TestCase):
             meant = [self.compile(source) for source in sources(PROJECT / "docs" / document)]
             self.assertEqual([len(image) for image in shown], [len(image) for image in meant], page)
 
-    def test_of_examples_compile(self):
-        for path in sorted((PROJECT / "examples").rglob("*.cdefsrc")):
+    def test_of_example_projects_compile(self):
+        for path in sorted((PROJECT / "examples/projects").rglob("*.cdefsrc")):
             with self.subTest(path.name):
                 self.compile(path.read_text())
+
+
+class Links(unittest.TestCase):
+    def test_of_documents_lead_to_files(self):
+        for path in DOCUMENTS:
+            for target in re.findall(r"\]\(([^)#]+)[^)]*\)", path.read_text()):
+                if "://" not in target:
+                    self.assertTrue((path.parent / target).exists(), f"{path.name}: {target}")
+
+    def test_every_document_is_in_the_index(self):
+        index = (PROJECT / "docs/README.md").read_text()
+        for path in DOCUMENTS:
+            self.assertIn(f"{path.name})", index, path.name)
 
 
 class Made(unittest.TestCase):

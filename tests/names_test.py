@@ -159,9 +159,6 @@ class Pages(Names):
 
 
 class Everywhere(Names):
-    def known(self):
-        return {word for rows in self.names.values() for row in rows for word in row}
-
     def test_name_equals_value_is_an_attribute(self):
         attributes = {row[1] for row in self.names["attribute"]}
         for path in (*DOCUMENTS, *PAGES):
@@ -169,6 +166,11 @@ class Everywhere(Names):
                 match = re.match(r"([A-Z][a-z]\w*)=", span)
                 if match:
                     self.assertIn(match.group(1), attributes, path)
+
+    def test_examples_use_every_stanza(self):
+        used = {word for path in (PROJECT / "examples").glob("*.cdefsrc")
+                for word in re.findall(r"^[A-Z]\w+", path.read_text(), re.M)}
+        self.assertEqual(used, {stanza for (stanza,) in self.names["stanza"]})
 
     def test_definition_is_a_stanza(self):
         stanzas = {stanza for (stanza,) in self.names["stanza"]}

@@ -114,7 +114,8 @@ class Compile:
 
     def test_time_of_building_is_left_out_on_request(self):
         self.project("cdgen_compile(with a.cdefsrc with.cdef BYTE_ORDER little)\n"
-                     "cdgen_compile(without a.cdefsrc without.cdef BYTE_ORDER little NO_TIMESTAMP)", a=DISK.read_bytes())
+                     "cdgen_compile(without a.cdefsrc without.cdef BYTE_ORDER little NO_TIMESTAMP)",
+                     a=DISK.read_bytes())
         environment = {name: value for name, value in os.environ.items() if name != "VX_CDB_FORCE_EMPTY_TIMESTAMP"}
         run("cmake", "--build", self.here / "b", env=environment)
         self.assertNotEqual(self.made("with.cdef")[16:20], bytes(4))
@@ -126,8 +127,8 @@ class Compile:
         names = [f"c{i}" for i in range(12)]
         for name in names:
             (sub / f"{name}.cdefsrc").write_bytes(DISK.read_bytes().replace(b"BlockSize", name.encode()))
-        (sub / "CMakeLists.txt").write_text("foreach(c IN ITEMS {0})\ncdgen_compile(all_of_them ${{c}}.cdefsrc ${{c}}.cdef)\n"
-                                            "endforeach()".format(" ".join(names)))
+        (sub / "CMakeLists.txt").write_text(
+            "\n".join(f"cdgen_compile(all_of_them {name}.cdefsrc {name}.cdef)" for name in names))
         self.project("add_subdirectory(classes)\n"
                      "add_custom_target(uses ALL COMMAND ${CMAKE_COMMAND} -E copy classes/c11.cdef taken.cdef)\n"
                      "add_dependencies(uses all_of_them)")

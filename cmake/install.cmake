@@ -47,3 +47,6 @@ install(FILES man/cdgen.1 man/cdef.1 DESTINATION "${CMAKE_INSTALL_MANDIR}/man1")
 install(FILES man/cdefsrc.5 man/cdb.5 DESTINATION "${CMAKE_INSTALL_MANDIR}/man5")
 install(FILES README.md CHANGELOG.md CONTRIBUTING.md LICENSE SECURITY.md DESTINATION "${CMAKE_INSTALL_DOCDIR}")
 install(DIRECTORY docs examples DESTINATION "${CMAKE_INSTALL_DOCDIR}")
+
+# For editors, which have no common place.
+install(DIRECTORY editors/vim editors/vscode DESTINATION "${CMAKE_INSTALL_DATADIR}/cdgen/editors")

@@ -50,3 +50,12 @@ install(DIRECTORY docs examples DESTINATION "${CMAKE_INSTALL_DOCDIR}")
 
 # For editors, which have no common place.
 install(DIRECTORY editors/vim editors/vscode DESTINATION "${CMAKE_INSTALL_DATADIR}/cdgen/editors")
+
+# For shells.
+set(CDGEN_ZSH_DIR "${CMAKE_INSTALL_DATADIR}/zsh/site-functions" CACHE STRING "Where zsh looks for completions")
+foreach(program IN ITEMS cdgen cdef)
+  install(FILES completions/${program}.bash DESTINATION "${CMAKE_INSTALL_DATADIR}/bash-completion/completions"
+    RENAME ${program})
+  install(FILES completions/_${program} DESTINATION "${CDGEN_ZSH_DIR}")
+  install(FILES completions/${program}.fish DESTINATION "${CMAKE_INSTALL_DATADIR}/fish/vendor_completions.d")
+endforeach()

@@ -42,7 +42,8 @@ class Reproducible(Case):
     def test_place_of_the_build_does_not_matter(self):
         """Another source directory and another build directory give the same programs, byte for byte."""
         copy = self.here / "another place for the sources"
-        files = subprocess.run(["git", "ls-files", "-z"], cwd=PROJECT, check=True, capture_output=True, text=True).stdout
+        files = subprocess.run(["git", "ls-files", "-z", "--cached", "--others", "--exclude-standard"], cwd=PROJECT,
+                               check=True, capture_output=True, text=True).stdout
         for name in filter(None, files.split("\0")):
             (copy / name).parent.mkdir(parents=True, exist_ok=True)
             shutil.copy(PROJECT / name, copy / name)

@@ -129,7 +129,7 @@ def textmate_grammar(stanzas, words):
             "value": {
                 "patterns": [
                     {"match": r'"[^"]*("|$)', "name": "string.quoted.double.cdefsrc"},
-                    {"match": rf"(?<=DataType=|VariableType=)({types})(?=[ \t#]|$)", "name": "storage.type.cdefsrc"},
+                    {"match": rf"(?:(?<=DataType=)|(?<=VariableType=))({types})(?=[ \t#]|$)", "name": "storage.type.cdefsrc"},
                     {"match": rf"(?<=[=,])({properties})(?=[, \t#]|$)", "name": "constant.language.cdefsrc"},
                     {"match": r"(?<=[=,.])-?(0[xX][0-9a-fA-F]+|[0-9]+)(?=[,. \t#]|$)",
                      "name": "constant.numeric.cdefsrc"},

@@ -1,0 +1,34 @@
+# Run by cpack over the staged tree, before the package is made: what Debian's policy asks for beyond cmake --install.
+
+if(NOT CPACK_GENERATOR STREQUAL "DEB")
+  return()
+endif()
+set(share "${CPACK_TEMPORARY_INSTALL_DIRECTORY}${CPACK_PACKAGING_INSTALL_PREFIX}/share")
+set(doc "${share}/doc/${CPACK_PACKAGE_NAME}")
+
+# The licence is one of those that every system has.
+file(REMOVE "${doc}/LICENSE")
+file(WRITE "${doc}/copyright" "Format: https://www.debian.org/doc/packaging-manuals/copyright-format/1.0/
+Upstream-Name: ${CPACK_PACKAGE_NAME}
+
+Files: *
+Copyright: 2026 ${CPACK_PACKAGE_VENDOR}
+License: Apache-2.0
+ On Debian systems the text of the licence is in
+ /usr/share/common-licenses/Apache-2.0.
+")
+
+file(WRITE "${doc}/changelog.Debian"
+  "${CPACK_PACKAGE_NAME} (${CPACK_PACKAGE_VERSION}-${CPACK_DEBIAN_PACKAGE_RELEASE}) unstable; urgency=medium
+
+  * What is new stands in changelog.gz.
+
+ -- ${CPACK_PACKAGE_CONTACT}  ${CPACK_CDGEN_RELEASED}
+")
+
+# Pages and changes are compressed, without a time, so that equal builds make equal packages.
+file(RENAME "${doc}/CHANGELOG.md" "${doc}/changelog")
+file(GLOB pages "${share}/man/man*/*")
+foreach(file IN LISTS pages ITEMS "${doc}/changelog" "${doc}/changelog.Debian")
+  execute_process(COMMAND gzip -9n "${file}" COMMAND_ERROR_IS_FATAL ANY)
+endforeach()

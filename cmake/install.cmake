@@ -1,0 +1,61 @@
+# What cmake --install puts where. Nothing of it holds the prefix, so an installed tree may be moved.
+
+include(GNUInstallDirs)
+include(CMakePackageConfigHelpers)
+
+set(package_dir "${CMAKE_INSTALL_LIBDIR}/cmake/cdgen")
+set(headers vx.h cdb.h cdb_fields.h cdb_view.h)
+list(TRANSFORM headers PREPEND "${PROJECT_SOURCE_DIR}/include/")
+
+install(TARGETS cdgen cdb_view EXPORT cdgenTargets)
+if(TARGET cdef)
+  install(TARGETS cdef EXPORT cdgenTargets)
+endif()
+target_include_directories(cdb_view INTERFACE "$<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}/cdgen>")
+install(FILES ${headers} DESTINATION "${CMAKE_INSTALL_INCLUDEDIR}/cdgen")
+
+# For find_package.
+configure_package_config_file(cmake/cdgenConfig.cmake.in cdgenConfig.cmake INSTALL_DESTINATION "${package_dir}")
+write_basic_package_version_file(cdgenConfigVersion.cmake COMPATIBILITY SameMinorVersion)
+install(EXPORT cdgenTargets NAMESPACE cdgen:: DESTINATION "${package_dir}")
+install(FILES "${CMAKE_CURRENT_BINARY_DIR}/cdgenConfig.cmake" "${CMAKE_CURRENT_BINARY_DIR}/cdgenConfigVersion.cmake"
+  cmake/cdgenCompile.cmake cmake/cdgenRun.cmake DESTINATION "${package_dir}")
+
+# For pkg-config. Paths count from the file itself, unless a directory was asked for that is outside the prefix.
+function(pc_path variable directory)
+  if(IS_ABSOLUTE "${directory}")
+    set(${variable} "${directory}" PARENT_SCOPE)
+  else()
+    set(${variable} "\${prefix}/${directory}" PARENT_SCOPE)
+  endif()
+endfunction()
+pc_path(pc_bindir "${CMAKE_INSTALL_BINDIR}")
+pc_path(pc_includedir "${CMAKE_INSTALL_INCLUDEDIR}")
+pc_path(pc_libdir "${CMAKE_INSTALL_LIBDIR}")
+if(IS_ABSOLUTE "${CMAKE_INSTALL_LIBDIR}")
+  set(pc_prefix "${CMAKE_INSTALL_PREFIX}")
+else()
+  file(RELATIVE_PATH up "/${CMAKE_INSTALL_LIBDIR}/pkgconfig" "/")
+  set(pc_prefix "\${pcfiledir}/${up}")
+  string(REGEX REPLACE "/$" "" pc_prefix "${pc_prefix}")
+endif()
+configure_file(cmake/cdgen.pc.in cdgen.pc @ONLY)
+install(FILES "${CMAKE_CURRENT_BINARY_DIR}/cdgen.pc" DESTINATION "${CMAKE_INSTALL_LIBDIR}/pkgconfig")
+
+# For people.
+install(FILES man/cdgen.1 man/cdef.1 DESTINATION "${CMAKE_INSTALL_MANDIR}/man1")
+install(FILES man/cdefsrc.5 man/cdb.5 DESTINATION "${CMAKE_INSTALL_MANDIR}/man5")
+install(FILES README.md CHANGELOG.md CONTRIBUTING.md LICENSE SECURITY.md DESTINATION "${CMAKE_INSTALL_DOCDIR}")
+install(DIRECTORY docs examples DESTINATION "${CMAKE_INSTALL_DOCDIR}")
+
+# For editors, which have no common place.
+install(DIRECTORY editors/vim editors/vscode DESTINATION "${CMAKE_INSTALL_DATADIR}/cdgen/editors")
+
+# For shells.
+set(CDGEN_ZSH_DIR "${CMAKE_INSTALL_DATADIR}/zsh/site-functions" CACHE STRING "Where zsh looks for completions")
+foreach(program IN ITEMS cdgen cdef)
+  install(FILES completions/${program}.bash DESTINATION "${CMAKE_INSTALL_DATADIR}/bash-completion/completions"
+    RENAME ${program})
+  install(FILES completions/_${program} DESTINATION "${CDGEN_ZSH_DIR}")
+  install(FILES completions/${program}.fish DESTINATION "${CMAKE_INSTALL_DATADIR}/fish/vendor_completions.d")
+endforeach()

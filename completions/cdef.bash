@@ -1,0 +1,22 @@
+# bash completion for cdef; what it understands is taken from its own help
+
+_cdef() {
+    local word subcommand=
+    for word in "${COMP_WORDS[@]:1:COMP_CWORD-1}"; do
+        [[ $word != -* ]] && subcommand=$word && break
+    done
+    if [[ $2 == -* ]]; then
+        local options
+        options=$("$1" ${subcommand:+"$subcommand"} --help 2>/dev/null | sed -n 's/^  \(-[^ ]*\).*/\1/p' | tr , ' ')
+        mapfile -t COMPREPLY < <(compgen -W "$options" -- "$2")
+    elif [[ ! $subcommand ]]; then
+        local subcommands
+        subcommands=$("$1" --help 2>/dev/null | sed -n '/^Subcommands:/,$ s/^  \([a-z][^ ]*\).*/\1/p')
+        mapfile -t COMPREPLY < <(compgen -W "$subcommands" -- "$2")
+    else
+        compopt -o filenames 2>/dev/null
+        mapfile -t COMPREPLY < <(compgen -f -X '!*.cdef*' -- "$2"; compgen -d -- "$2")
+    fi
+}
+
+complete -F _cdef cdef

@@ -1,0 +1,87 @@
+#!/usr/bin/env python3
+"""Compiles what the documents, the manual pages and examples/ show, and holds made files against what makes them.
+
+    documents_test.py CDGEN LIST_NAMES
+"""
+
+import pathlib
+import re
+import subprocess
+import sys
+import tempfile
+import unittest
+
+from documents import DOCUMENTS, PAGES, PROJECT, sources
+
+CDGEN = LIST_NAMES = ""
+WITH_SOURCES = {"README.md", "language.md", "format.md", "cdgen.1", "cdefsrc.5", "cdb.5"}
+
+
+def made_by(script, *arguments):
+    """What a script writes to an empty directory: name -> contents."""
+    with tempfile.TemporaryDirectory() as place:
+        for directory in ("vim/syntax", "vscode/syntaxes"):
+            (pathlib.Path(place) / directory).mkdir(parents=True)
+        subprocess.run([sys.executable, "-B", PROJECT / script, *arguments, place], check=True)
+        return {str(path.relative_to(place)): path.read_text() for path in pathlib.Path(place).rglob("*")
+                if path.is_file()}
+
+
+class Sources(unittest.TestCase):
+    def compile(self, source):
+        with tempfile.TemporaryDirectory() as place:
+            (pathlib.Path(place) / "a.cdefsrc").write_text(source)
+            done = subprocess.run([CDGEN, "a.cdefsrc", "a.cdef"], cwd=place, capture_output=True, text=True)
+            self.assertEqual((done.returncode, done.stderr), (0, ""), source)
+            return (pathlib.Path(place) / "a.cdef").read_bytes()
+
+    def test_of_documents_and_pages_compile(self):
+        found = set()
+        for path in (*DOCUMENTS, *PAGES):
+            for source in sources(path):
+                with self.subTest(path.name):
+                    self.compile(source)
+                    found.add(path.name)
+        self.assertLessEqual(WITH_SOURCES, found)
+
+    def test_pages_show_the_same_classes_as_documents(self):
+        for document, page in (("language.md", "cdefsrc.5"), ("format.md", "cdb.5")):
+            shown = [self.compile(re.sub(r"(?m)^ {8}", "\t", source)) for source in sources(PROJECT / "man" / page)]
+            meant = [self.compile(source) for source in sources(PROJECT / "docs" / document)]
+            self.assertEqual([len(image) for image in shown], [len(image) for image in meant], page)
+
+    def test_of_example_projects_compile(self):
+        for path in sorted((PROJECT / "examples/projects").rglob("*.cdefsrc")):
+            with self.subTest(path.name):
+                self.compile(path.read_text())
+
+
+class Links(unittest.TestCase):
+    def test_of_documents_lead_to_files(self):
+        for path in DOCUMENTS:
+            for target in re.findall(r"\]\(([^)#]+)[^)]*\)", path.read_text()):
+                if "://" not in target:
+                    self.assertTrue((path.parent / target).exists(), f"{path.name}: {target}")
+
+    def test_every_document_is_in_the_index(self):
+        index = (PROJECT / "docs/README.md").read_text()
+        for path in DOCUMENTS:
+            self.assertIn(f"{path.name})", index, path.name)
+
+
+class Made(unittest.TestCase):
+    def test_pages_are_up_to_date(self):
+        made = made_by("man/from_markdown.py")
+        self.assertEqual(sorted(made), ["cdb.5", "cdefsrc.5"])
+        for name, text in made.items():
+            self.assertTrue((PROJECT / "man" / name).read_text() == text, f"{name}: run man/from_markdown.py")
+
+    def test_editor_files_are_up_to_date(self):
+        for name, text in made_by("editors/generate.py", LIST_NAMES).items():
+            self.assertTrue((PROJECT / "editors" / name).read_text() == text, f"{name}: run editors/generate.py")
+
+
+if __name__ == "__main__":
+    LIST_NAMES = sys.argv.pop(2)
+    CDGEN = sys.argv.pop(1)
+    unittest.main(verbosity=2)

@@ -1,0 +1,176 @@
+"""The CMake package: finding it, linking the reader, and cdgen_compile, with each of the generators."""
+
+import os
+import shutil
+import time
+import unittest
+
+from installed import EXAMPLES, Case, only, run, tree
+
+DISK = EXAMPLES / "projects/cmake/classes/Disk.cdefsrc"
+HEAD = """cmake_minimum_required(VERSION 3.25)
+project(trial LANGUAGES NONE)
+find_package(cdgen REQUIRED)
+"""
+LITTLE, BIG = b"1tmf", b"fmt1"
+
+
+def found_in(root=None):
+    """For a project without a language, which does not search directories that are named after a machine."""
+    place = only("lib*/**/cdgenConfig.cmake").parent
+    return f"-Dcdgen_DIR={(root or tree()) / place.relative_to(tree())}"
+
+
+def later(path):
+    """Makes a file newer than whatever was built."""
+    soon = time.time() + 5
+    os.utime(path, (soon, soon))
+
+
+class Trial(Case):
+    """A project made for the test; its classes add the generator."""
+
+    def project(self, text, **files):
+        (self.here / "CMakeLists.txt").write_text(HEAD + text)
+        for name, source in files.items():
+            (self.here / f"{name}.cdefsrc").write_bytes(source)
+        run("cmake", "-G", self.GENERATOR, "-S", self.here, "-B", self.here / "b", found_in())
+
+    def build(self, *options, **environment):
+        return run("cmake", "--build", self.here / "b", *options, env={**os.environ, **environment})
+
+    def made(self, name):
+        return (self.here / "b" / name).read_bytes()
+
+    def leftovers(self):
+        return [str(path) for path in (self.here / "b").rglob(".cdgen-*")]
+
+
+class Compile:
+    """What holds with every generator."""
+
+    def test_class_without_name_is_called_after_the_bare_output(self):
+        self.project("cdgen_compile(disk a.cdefsrc deep/er/Disk.cdef)", a=DISK.read_bytes())
+        self.build()
+        self.assertIn(b"\0Disk\0", self.made("deep/er/Disk.cdef"))
+        self.assertEqual(self.leftovers(), [])
+
+    def test_changed_source_is_compiled_again(self):
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=DISK.read_bytes())
+        self.build()
+        (self.here / "a.cdefsrc").write_bytes(DISK.read_bytes().replace(b"BlockSize", b"SectorLen"))
+        later(self.here / "a.cdefsrc")
+        self.build()
+        self.assertIn(b"SectorLen", self.made("a.cdef"))
+
+    def test_nothing_changed_nothing_done(self):
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=DISK.read_bytes())
+        self.build()
+        before = (self.here / "b/a.cdef").stat()
+        self.build()
+        self.assertEqual((self.here / "b/a.cdef").stat().st_ino, before.st_ino)
+
+    def test_changed_compiler_compiles_again(self):
+        copy = self.here / "tree"
+        shutil.copytree(tree(), copy)
+        (self.here / "a.cdefsrc").write_bytes(DISK.read_bytes())
+        (self.here / "CMakeLists.txt").write_text(HEAD + "cdgen_compile(disk a.cdefsrc a.cdef)")
+        run("cmake", "-G", self.GENERATOR, "-S", self.here, "-B", self.here / "b", found_in(copy))
+        self.build()
+        before = (self.here / "b/a.cdef").stat()
+        later(copy / "bin/cdgen")
+        self.build()
+        self.assertNotEqual((self.here / "b/a.cdef").stat().st_ino, before.st_ino)
+
+    def test_failure_leaves_no_target(self):
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=b"ControlDefinition\n\tFileVersoin=1\n")
+        with self.assertRaises(AssertionError) as failed:
+            self.build()
+        self.assertIn(f"{self.here}/a.cdefsrc:2: error: Attribute name not defined in table", str(failed.exception))
+        self.assertFalse((self.here / "b/a.cdef").exists())
+        self.assertEqual(self.leftovers(), [])
+
+    def test_failure_is_tried_again(self):
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=DISK.read_bytes())
+        self.build()
+        (self.here / "a.cdefsrc").write_bytes(b"no such stanza\n")
+        later(self.here / "a.cdefsrc")
+        for _ in range(2):
+            self.assertRaises(AssertionError, self.build)
+
+    def test_no_output_without_the_map(self):
+        """What cdgen refuses at the end of a source, it refuses before there is an output."""
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=DISK.read_bytes().split(b"ClassToManagerMapping")[0])
+        with self.assertRaises(AssertionError) as failed:
+            self.build()
+        self.assertIn(f"{self.here}/a.cdefsrc: error: No class-to-manager maps defined", str(failed.exception))
+        self.assertFalse((self.here / "b/a.cdef").exists())
+
+    def test_byte_order_is_the_one_asked_for(self):
+        self.project("cdgen_compile(both a.cdefsrc little.cdef BYTE_ORDER little)\n"
+                     "cdgen_compile(both a.cdefsrc big.cdef BYTE_ORDER big)", a=DISK.read_bytes())
+        self.build()
+        self.assertEqual((self.made("little.cdef")[8:12], self.made("big.cdef")[8:12]), (LITTLE, BIG))
+
+    def test_time_of_building_is_left_out_on_request(self):
+        self.project("cdgen_compile(with a.cdefsrc with.cdef BYTE_ORDER little)\n"
+                     "cdgen_compile(without a.cdefsrc without.cdef BYTE_ORDER little NO_TIMESTAMP)",
+                     a=DISK.read_bytes())
+        environment = {name: value for name, value in os.environ.items() if name != "VX_CDB_FORCE_EMPTY_TIMESTAMP"}
+        run("cmake", "--build", self.here / "b", env=environment)
+        self.assertNotEqual(self.made("with.cdef")[16:20], bytes(4))
+        self.assertEqual(self.made("without.cdef")[16:24], bytes(8))
+
+    def test_several_targets_from_a_subdirectory_in_parallel(self):
+        sub = self.here / "classes"
+        sub.mkdir()
+        names = [f"c{i}" for i in range(12)]
+        for name in names:
+            (sub / f"{name}.cdefsrc").write_bytes(DISK.read_bytes().replace(b"BlockSize", name.encode()))
+        (sub / "CMakeLists.txt").write_text(
+            "\n".join(f"cdgen_compile(all_of_them {name}.cdefsrc {name}.cdef)" for name in names))
+        self.project("add_subdirectory(classes)\n"
+                     "add_custom_target(uses ALL COMMAND ${CMAKE_COMMAND} -E copy classes/c11.cdef taken.cdef)\n"
+                     "add_dependencies(uses all_of_them)")
+        self.build("--parallel", "4")
+        for name in names:
+            self.assertIn(name.encode() + b"\0", self.made(f"classes/{name}.cdef"))
+        self.assertEqual(self.made("taken.cdef"), self.made("classes/c11.cdef"))
+
+    def test_absolute_paths_are_taken_as_they_are(self):
+        self.project(f'cdgen_compile(disk "{DISK}" "{self.here}/elsewhere/Disk.cdef")')
+        self.build()
+        self.assertTrue((self.here / "elsewhere/Disk.cdef").exists())
+
+    def test_quarrels_with_what_it_does_not_know(self):
+        for words in ("NO_TIME", "BYTE_ORDER middle", "BYTE_ORDER"):
+            with self.subTest(words), self.assertRaises(AssertionError) as failed:
+                self.project(f"cdgen_compile(disk a.cdefsrc a.cdef {words})", a=DISK.read_bytes())
+            self.assertIn("cdgen_compile:", str(failed.exception))
+
+
+class Ninja(Compile, Trial):
+    GENERATOR = "Ninja"
+
+
+class Make(Compile, Trial):
+    GENERATOR = "Unix Makefiles"
+
+
+class Package(Case):
+    def test_wants_a_version_of_the_same_minor_number(self):
+        for version, found in (("0.1", True), ("0.1.0", True), ("0.2", False), ("1.0", False)):
+            (self.here / "CMakeLists.txt").write_text(HEAD.replace("cdgen REQUIRED", f"cdgen {version}") +
+                                                      'message(STATUS "found: ${cdgen_FOUND}")')
+            said = run("cmake", "-S", self.here, "-B", self.here / version, found_in())
+            self.assertIn(f"found: {int(found)}", said, version)
+
+    def test_offers_the_inspector(self):
+        (self.here / "CMakeLists.txt").write_text(
+            HEAD + "add_custom_target(version ALL COMMAND cdgen::cdef --version VERBATIM)")
+        run("cmake", "-S", self.here, "-B", self.here / "b", found_in())
+        self.assertRegex(run("cmake", "--build", self.here / "b"), r"cdef \d+\.\d+\.\d+")
+
+
+if __name__ == "__main__":
+    unittest.main()

@@ -1,0 +1,58 @@
+"""The Debian package: what Debian's checker says, and installing, running and removing it in a root of its own."""
+
+import os
+import pathlib
+import shutil
+import subprocess
+import tempfile
+import unittest
+
+from installed import BUILD, EXAMPLES, PROJECT, Case, run
+
+
+class Package(Case):
+    @classmethod
+    def setUpClass(cls):
+        place = tempfile.TemporaryDirectory(prefix="cdgen-package-")
+        cls.addClassCleanup(place.cleanup)
+        run("cpack", "-G", "DEB", "-B", place.name, cwd=BUILD)
+        (cls.package,) = pathlib.Path(place.name).glob("*.deb")
+
+    def test_lintian_finds_no_error(self):
+        run("lintian", "--no-cfg", "--allow-root", "--fail-on", "error", self.package)
+
+    @unittest.skipUnless(os.geteuid() == 0, "dpkg gives files to root")
+    def test_installs_runs_and_goes_away_again(self):
+        for directory in ("updates", "info"):
+            (self.here / "var/lib/dpkg" / directory).mkdir(parents=True)
+        for file in ("status", "available"):
+            (self.here / "var/lib/dpkg" / file).write_text("")
+        dpkg = ["dpkg", f"--root={self.here}", "--force-depends", "--log=/dev/null"]
+        run(*dpkg, "--install", self.package)
+        run(self.here / "usr/bin/cdgen", EXAMPLES / "FileSystem.cdefsrc", self.here / "a.cdef")
+        self.assertEqual(run(self.here / "usr/bin/cdef", "verify", self.here / "a.cdef"), "")
+        run(*dpkg, "--remove", "cdgen")
+        self.assertFalse(list((self.here / "usr").rglob("*")) if (self.here / "usr").exists() else [])
+
+    def test_says_what_its_programs_need(self):
+        self.assertIn("libstdc++6", run("dpkg-deb", "--field", self.package, "Depends"))
+
+
+class Reproducible(Case):
+    def test_place_of_the_build_does_not_matter(self):
+        """Another source directory and another build directory give the same programs, byte for byte."""
+        copy = self.here / "another place for the sources"
+        files = subprocess.run(["git", "ls-files", "-z", "--cached", "--others", "--exclude-standard"], cwd=PROJECT,
+                               check=True, capture_output=True, text=True).stdout
+        for name in filter(None, files.split("\0")):
+            (copy / name).parent.mkdir(parents=True, exist_ok=True)
+            shutil.copy(PROJECT / name, copy / name)
+        build = self.here / "b"
+        run("cmake", "--preset", "package", "-S", copy, "-B", build, cwd=copy)
+        run("cmake", "--build", build)
+        for name in ("cdgen", "cdef", "libcdb_view.a"):
+            self.assertTrue((build / name).read_bytes() == (BUILD / name).read_bytes(), name)
+
+
+if __name__ == "__main__":
+    unittest.main()

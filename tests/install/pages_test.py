@@ -1,0 +1,60 @@
+"""The manual pages as a reader gets them."""
+
+import itertools
+import os
+import re
+import subprocess
+import unittest
+
+from installed import run, tree
+from understood import options, options_of_cdgen, subcommands
+
+
+class Pages(unittest.TestCase):
+    def setUp(self):
+        self.pages = sorted((tree() / "share/man").glob("man*/*"))
+
+    def test_man_has_nothing_to_warn_of(self):
+        for page, width in itertools.product(self.pages, ("80", "132")):
+            with self.subTest(page.name, width=width):
+                done = subprocess.run(["man", "--warnings", "--local-file", page], capture_output=True, check=True,
+                                      env={**os.environ, "MANWIDTH": width})
+                self.assertEqual(done.stderr.decode(), "")
+                self.assertIn(b"NAME", done.stdout)
+
+    def test_mandoc_has_nothing_to_warn_of(self):
+        for page in self.pages:
+            self.assertEqual(run("mandoc", "-Tlint", "-W", "warning", page), "")
+
+    def test_man_finds_each_by_its_name(self):
+        for page in self.pages:
+            name, section = page.name.split(".")
+            shown = run("man", "--manpath", tree() / "share/man", section, name)
+            self.assertIn(f"{name.upper()}({section})", shown)
+
+
+class Options(unittest.TestCase):
+    """The handwritten pages have what the programs understand."""
+
+    def page(self, name):
+        return (tree() / f"share/man/man1/{name}.1").read_text()
+
+    def test_of_cdgen(self):
+        said = set(re.findall(r"^\.It Fl (\w)", self.page("cdgen"), re.M))
+        self.assertEqual({f"-{letter}" for letter in said}, options_of_cdgen())
+
+    def test_of_cdef(self):
+        common, *parts = re.split(r"^\.It Cm ", self.page("cdef"), flags=re.M)
+        parts[-1], further = parts[-1].split("Further options:")
+        said = {part.split("\n")[0]: self.options_in(part) for part in parts}
+        shared = self.options_in(further)
+        self.assertEqual(shared, options())
+        for subcommand in subcommands():
+            self.assertEqual(said[subcommand] | {"-h", "--help"}, options(subcommand), subcommand)
+
+    def options_in(self, text):
+        return {f"-{name}" for line in re.findall(r"^\.It Fl (.*)", text, re.M) for name in line.split(" , ")}
+
+
+if __name__ == "__main__":
+    unittest.main()

@@ -1,0 +1,63 @@
+"""What is installed, and where."""
+
+import os
+import unittest
+
+from installed import BUILD, EXAMPLES, Case, only, pkg_config_environment, program, run, tree
+
+
+class Tree(Case):
+    def test_programs_run(self):
+        run(program("cdgen"), EXAMPLES / "FileSystem.cdefsrc", self.here / "a.cdef")
+        self.assertEqual(run(program("cdef"), "verify", self.here / "a.cdef"), "")
+
+    def test_has_the_four_headers_and_no_other(self):
+        headers = sorted(path.name for path in (tree() / "include").rglob("*.h"))
+        self.assertEqual(headers, ["cdb.h", "cdb_fields.h", "cdb_view.h", "vx.h"])
+
+    def test_library_holds_machine_code(self):
+        """Objects of another compiler's link-time optimisation could not be linked."""
+        self.assertNotIn("gnu.lto", run("readelf", "--section-headers", "--wide", only("lib*/**/libcdb_view.a")))
+
+    def test_each_page_is_in_its_section(self):
+        pages = sorted(path.name for path in (tree() / "share/man").glob("man*/*"))
+        self.assertEqual(pages, ["cdb.5", "cdef.1", "cdefsrc.5", "cdgen.1"])
+
+    def test_nothing_holds_the_prefix(self):
+        prefix = str(tree().parent / "before").encode()
+        for path in tree().rglob("*"):
+            if path.is_file():
+                self.assertNotIn(prefix, path.read_bytes(), path)
+
+    def test_nothing_holds_the_place_of_the_build(self):
+        for path in tree().rglob("*"):
+            if path.is_file():
+                self.assertNotIn(str(BUILD).encode(), path.read_bytes(), path)
+
+    def test_destdir_is_put_in_front_of_the_prefix(self):
+        run("cmake", "--install", BUILD, "--prefix", "/some/prefix", env={**os.environ, "DESTDIR": str(self.here)})
+        self.assertTrue((self.here / "some/prefix/bin/cdgen").is_file())
+        self.assertEqual([path.name for path in self.here.iterdir()], ["some"])
+
+
+class PkgConfig(unittest.TestCase):
+    def asked(self, *what):
+        return run("pkg-config", *what, "cdgen", env=pkg_config_environment()).strip().replace("\\ ", " ")
+
+    def test_names_the_programs(self):
+        for name in ("cdgen", "cdef"):
+            said = self.asked(f"--variable={name}")
+            self.assertTrue(os.path.samefile(said, program(name)), said)
+
+    def test_has_the_version_of_the_program(self):
+        self.assertEqual("cdef " + self.asked("--modversion"), run(program("cdef"), "--version").strip())
+
+    def test_has_what_compiling_and_linking_take(self):
+        self.assertTrue(os.path.samefile(self.asked("--cflags").removeprefix("-I"), tree() / "include/cdgen"))
+        place, name = self.asked("--libs").split(" -l")
+        self.assertEqual(name, "cdb_view")
+        self.assertTrue(os.path.samefile(place.removeprefix("-L"), only("lib*/**/libcdb_view.a").parent))
+
+
+if __name__ == "__main__":
+    unittest.main()

@@ -1,0 +1,184 @@
+#!/usr/bin/env python3
+"""Holds the names in the documents and the manual pages against those that the compiler and the format have.
+
+    names_test.py LIST_NAMES
+
+LIST_NAMES is the program that prints them, tests/tools/list_names.cpp.
+"""
+
+import collections
+import re
+import subprocess
+import sys
+import unittest
+
+from documents import DOCUMENTS, PAGES, PROJECT, chapters, sources, spans, tables, text_of
+
+LANGUAGE, FORMAT = PROJECT / "docs/language.md", PROJECT / "docs/format.md"
+# Records that have no chapter of their own: entries of lists, and what stands in tables of other chapters.
+ENTRIES = {"vl_entry_t": "variety_list_t", "vv_entry_t": "valid_values_t", "sd_field_t": "sd_def_t",
+           "sbs_field_t": "sbs_def_t", "rc_hash_block_t": "rsrc_class_hash_t"}
+# The members that hold the entries: the document has the entries themselves in their place.
+ARRAYS = {"vl_values", "vv_values", "sd_fields", "sbs_fields", "rc_hash_blocks"}
+UNION = {"u_ctxt": ["u_offset", "u_ctxt_name", "u_ctxt_pattr_id"]}  # likewise, of its members
+SD_KINDS = "The nine SD definitions"
+
+
+def read_names(program):
+    names = collections.defaultdict(list)
+    for line in subprocess.run([program], check=True, capture_output=True, text=True).stdout.splitlines():
+        kind, *rest = line.split()
+        names[kind].append(tuple(rest))
+    return names
+
+
+def known_fields(names):
+    """record -> fields, those of entries with the record that they follow."""
+    found = collections.defaultdict(list)
+    for record, field in names["field"]:
+        if field not in ARRAYS:
+            found[ENTRIES.get(record, record)] += UNION.get(field, field.split("."))
+    return found
+
+
+class Names(unittest.TestCase):
+    maxDiff = None
+    names = {}
+
+
+class Language(Names):
+    """docs/language.md"""
+
+    def stanza_chapters(self):
+        """The chapters about stanzas: whose they are, and their rows about attributes."""
+        found = {}
+        for title, text in chapters(LANGUAGE, 3):
+            rows = [row for table in tables(text) if table[0][0] == "attribute" for row in table]
+            if rows:
+                kinds = spans(text.split("| attribute")[0]) if title == SD_KINDS else title.split(", ")
+                for kind in kinds:
+                    found[kind] = rows
+        return found
+
+    def said_of(self, rows, earlier):
+        """attribute -> (required, repeats), as the rows say; 'as above' stands for another stanza's."""
+        head, said = rows[0], {}
+        for row in rows[1:]:
+            cell = dict(zip(head, row))
+            for name in spans(cell["attribute"]):
+                words = [cell["required"], cell.get("repeats", "no")]
+                if "as above" in words:
+                    words = [above if word == "as above" else word for word, above in zip(words, earlier[name])]
+                said[name] = tuple(words)
+        return said
+
+    def test_each_stanza_has_its_attributes(self):
+        said, earlier = {}, {}
+        for kind, rows in self.stanza_chapters().items():
+            earlier = said[kind] = self.said_of(rows, earlier)
+        known = {stanza: {} for (stanza,) in self.names["stanza"]}
+        for stanza, name, needed, often in self.names["attribute"]:
+            known[stanza][name] = ("yes" if needed == "required" else "no", "yes" if often == "repeats" else "no")
+        self.assertEqual(said, known)
+
+    def test_list_of_stanzas_is_complete(self):
+        listed = [name for row in tables(dict(chapters(LANGUAGE, 2))["Stanzas"].split("###")[0])[0][1:]
+                  for name in spans(row[0])]
+        self.assertEqual(sorted(listed), sorted(stanza for (stanza,) in self.names["stanza"]))
+
+    def words(self):
+        return tables(dict(chapters(LANGUAGE, 2))["Names"])
+
+    def test_properties(self):
+        of_class, of_others, _ = self.words()
+        said = {("class", name) for row in of_class[1:] for name in spans(" ".join(row))}
+        for row in of_others[1:]:
+            said |= {(row[0].split()[0], name) for name in spans(row[1])}
+        self.assertEqual(said, set(self.names["property"]))
+
+    def test_permissions(self):
+        letters = self.words()[2][0][1:]
+        self.assertEqual(letters, [letter for (letter,) in self.names["permission"]])
+
+    def test_data_types(self):
+        said = [name for row in tables(dict(chapters(LANGUAGE, 2))["Data types"])[0][1:] for name in spans(row[0])]
+        self.assertEqual(sorted(said), sorted(name for (name,) in self.names["type"]))
+
+    def test_variable_types(self):
+        said = re.search(r"\| `VariableType` \| yes \| no \| (.*?) \|", LANGUAGE.read_text()).group(1)
+        self.assertEqual(spans(said), [name for (name,) in self.names["variable"]])
+
+
+class Format(Names):
+    """docs/format.md"""
+
+    def said(self):
+        """record -> fields, of chapters whose heading names a record."""
+        found = {}
+        for title, text in chapters(FORMAT, 3):
+            for record in re.findall(r"`(\w+_t)`", title):
+                found[record] = [name for table in tables(text) if table[0][0] == "offset"
+                                 for row in table[1:] for name in re.findall(r"`(\w+)`", row[2])]
+        return found
+
+    def test_each_record_has_its_fields(self):
+        known = known_fields(self.names)
+        for record, fields in self.said().items():
+            with self.subTest(record):
+                self.assertEqual(sorted(set(fields)), sorted(set(known[record])))
+
+    def test_each_record_has_a_chapter(self):
+        out_of_line = {"vx_array_t", "vx_structured_data_t", "vx_structured_data_element_t"}  # one table, "Values"
+        self.assertEqual(set(self.said()), set(known_fields(self.names)) - out_of_line)
+
+
+class Pages(Names):
+    """The manual pages, which their readers may have nothing else than."""
+
+    def missing(self, page, names):
+        text = text_of(PROJECT / "man" / page)
+        return sorted({name for name in names if not re.search(rf"\b{re.escape(name)}\b", text)})
+
+    def test_source_page_has_every_name(self):
+        wanted = {row[-1] for kind in ("stanza", "type", "variable", "property") for row in self.names[kind]}
+        wanted |= {row[1] for row in self.names["attribute"]}
+        self.assertEqual(self.missing("cdefsrc.5", wanted), [])
+
+    def test_database_page_has_every_field(self):
+        for record, fields in known_fields(self.names).items():
+            self.assertEqual(self.missing("cdb.5", fields), [], record)
+
+    def test_whole_class_has_every_form_of_stanza(self):
+        """Who knows nothing but the page finds a complete class in it."""
+        most = max(sources(PROJECT / "man/cdefsrc.5"), key=len)
+        used = set(re.findall(r"^[A-Z]\w+", most, re.M))
+        for wanted in ("ControlDefinition", "ResourceClass", "ResourceVariableClass", "PersistentResourceAttribute",
+                       "DynamicClassAttribute", "DynamicResourceAttribute", "PAttrSDDefinition", "OnlineSDDefinition",
+                       "ResourceAction", "ActionInSDDefinition", "ActionOutSDDefinition", "ClassToManagerMapping"):
+            self.assertIn(wanted, used)
+
+
+class Everywhere(Names):
+    def test_name_equals_value_is_an_attribute(self):
+        attributes = {row[1] for row in self.names["attribute"]}
+        for path in (*DOCUMENTS, *PAGES):
+            for span in spans(path.read_text()):
+                match = re.match(r"([A-Z][a-z]\w*)=", span)
+                if match:
+                    self.assertIn(match.group(1), attributes, path)
+
+    def test_examples_use_every_stanza(self):
+        used = {word for path in (PROJECT / "examples").glob("*.cdefsrc")
+                for word in re.findall(r"^[A-Z]\w+", path.read_text(), re.M)}
+        self.assertEqual(used, {stanza for (stanza,) in self.names["stanza"]})
+
+    def test_definition_is_a_stanza(self):
+        stanzas = {stanza for (stanza,) in self.names["stanza"]}
+        for path in (*DOCUMENTS, *PAGES):
+            for word in re.findall(r"\b[A-Z]\w+(?:Definition|ResourceAttribute|ClassAttribute)\b", text_of(path)):
+                self.assertIn(word, stanzas, path)
+
+
+if __name__ == "__main__":
+    Names.names = read_names(sys.argv.pop(1))
+    unittest.main(verbosity=2)

@@ -12,6 +12,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <fcntl.h>
+#include <fstream>
 #include <string>
 #include <sys/mman.h>
 #include <unistd.h>
@@ -59,6 +60,13 @@ private:
     FILE *null = nullptr;
 };
 
+/* The lowest descriptor that is free. */
+int probe() {
+    int fd = open("/dev/null", O_RDONLY | O_CLOEXEC);
+    close(fd);
+    return fd;
+}
+
 /* The status, as the driver has it. */
 int compile_one(unsigned options, const std::string &source, const std::string &output) {
     cdgen cx;
@@ -74,6 +82,18 @@ int compile_one(unsigned options, const std::string &source, const std::string &
         return failure.code;
     }
     return 0;
+}
+
+/* A mapping takes long to see, so it is looked for now and then only. */
+void expect_no_mapping() {
+    constexpr unsigned NOW_AND_THEN = 1024;
+    static unsigned runs = 0;
+    if (++runs % NOW_AND_THEN != 0)
+        return;
+    std::ifstream maps("/proc/self/maps");
+    for (std::string line; std::getline(maps, line);)
+        fuzz::require(line.find("/memfd:source") == std::string::npos && line.find("/cdgen-fuzz-") == std::string::npos,
+                      "a file stayed mapped");
 }
 
 void look_through(const std::string &output) {
@@ -99,7 +119,11 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size
     if ((options & 0x20) == 0)
         unlink(output.c_str());
     bool existed = access(output.c_str(), F_OK) == 0;
-    if (compile_one(options, f.source, output) == 0)
+    int lowest_free = probe();
+    int status = compile_one(options, f.source, output);
+    fuzz::require(probe() == lowest_free, "a descriptor stayed open");
+    expect_no_mapping();
+    if (status == 0)
         look_through(output);
     else
         fuzz::require(existed == (access(output.c_str(), F_OK) == 0), "the output was touched");

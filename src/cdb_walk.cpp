@@ -35,6 +35,11 @@ constexpr record_size record_sizes[] = {
     {offsetof(orb_cdb_header_t, cdb_hdr_rsrc_depend_size), sizeof(rsrc_depend_t)},
 };
 
+/* Of a record of which there are many. */
+bool is_name(const field &f) {
+    return f.name == "u_ra_name" || f.name == "u_ac_name" || f.name == "u_sd_field_name";
+}
+
 const spot whole_file = {.section = std::nullopt, .record = "orb_cdb_header_t"};
 
 } // namespace
@@ -57,6 +62,20 @@ extent::claim_result extent::claim(std::size_t at, std::size_t length) {
         taken[unit] = owner;
     }
     return claim_result::FIRST;
+}
+
+extent::text_claim extent::claim_text(std::size_t at, std::size_t end) {
+    auto owner = static_cast<std::uint32_t>(at / UNIT + 1);
+    for (std::size_t place = at; place < end; place += UNIT) {
+        if (is_taken(place))
+            return {place - at, false};
+        taken[place / UNIT] = owner;
+        std::size_t size = std::min(UNIT, end - place);
+        std::size_t length = area.part(place, size).text(std::size_t{0}).size();
+        if (length < size)
+            return {place + length + 1 - at, true};
+    }
+    return {end - at, false};
 }
 
 /* ---- Saying what was seen -------------------------------------------------------------------------------------- */
@@ -117,6 +136,10 @@ void walker::visit_text(const spot &at, const field &ref, std::uint32_t offset, 
     else if (offset >= strings.texts_end)
         report(check::TEXT_OUTSIDE, at, ref.name, place, std::to_string(offset),
                "a text in " + std::to_string(strings.area.size()) + " bytes");
+    else if (offset == 0 && (!is_name(ref) || may_be_unset))
+        strings.first_text_asked_for = true;
+    else if (strings.text_starts[offset / extent::UNIT])
+        report(check::VALUE_SHARED, at, ref.name, place, std::to_string(offset), "a text of its own");
     else
         note_text(at, strings, offset);
 }
@@ -135,13 +158,12 @@ void walker::note_text(spot at, extent &strings, std::size_t offset) {
 /* One text, which reaches to the place end at the most: there the next text begins, or the table ends. */
 void walker::walk_text(const spot &at, extent &strings, std::size_t start, std::size_t end) {
     std::size_t file_offset = strings.offset + start;
-    std::size_t length = strings.area.part(start, end - start).text(std::size_t{0}).size();
-    bool ends = length < end - start;
-    add_region(at, file_offset, length + ends, "text");
-    if (!ends || strings.claim(start, length + 1) != extent::claim_result::FIRST)
+    auto [size, whole] = strings.claim_text(start, end);
+    add_region(at, file_offset, size, "text");
+    if (!whole)
         return report(check::VALUE_SHARED, at, {}, file_offset, "a text that runs into something else",
                       "a place of its own");
-    std::size_t filling = start + length + 1;
+    std::size_t filling = start + size;
     std::size_t filled = std::min(end, extent::units(filling) * extent::UNIT);
     spot place = at;
     place.offset = strings.offset + filling;
@@ -152,6 +174,8 @@ void walker::walk_text(const spot &at, extent &strings, std::size_t start, std::
 void walker::finish_texts(spot at, extent &strings) {
     at.record = "text";
     at.index = 0;
+    if (strings.first_text_asked_for)
+        strings.text_starts[0] = true;
     std::optional<std::size_t> start;
     for (std::size_t unit = 0; unit < strings.text_starts.size(); ++unit)
         if (strings.text_starts[unit]) {
@@ -227,11 +251,11 @@ bool walker::walk_header() {
         report(check::FILE_SHORT, whole_file, {}, 0, db.file().size(), sizeof(orb_cdb_header_t));
         return false;
     }
-    visit<orb_cdb_header_t>(whole_file, db.file(), 0);
     check_length();
     check_checksum();
     check_record_sizes();
-    return true;
+    visit<orb_cdb_header_t>(whole_file, db.file(), 0);
+    return db.recognised();
 }
 
 /* ---- Sections -------------------------------------------------------------------------------------------------- */

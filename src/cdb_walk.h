@@ -101,6 +101,18 @@ public:
     /* Claims length bytes, all inside the area, from a multiple of UNIT on. AGAIN: they are claimed from the same place
      * on already. Takes time in proportion to what it newly claims. */
     claim_result claim(std::size_t at, std::size_t length);
+
+    /* What was claimed of a text; whole: its zero byte is part of it. Else it ran into something else, or to its limit.
+     */
+    struct text_claim {
+        std::size_t size;
+        bool whole;
+    };
+    /* Claims a text that ends before the place end. at is a multiple of UNIT. Takes time in proportion to what it
+     * claims.
+     */
+    text_claim claim_text(std::size_t at, std::size_t end);
+
     /* at < area.size() */
     bool is_taken(std::size_t at) const {
         return taken[at / UNIT] != 0;
@@ -117,8 +129,9 @@ private:
     std::vector<std::uint32_t> taken; /* by unit: the unit, counted from 1, at which what covers it begins; 0: free */
 
 public:
-    std::vector<bool> text_starts; /* by unit: a text begins there */
-    std::size_t texts_end;         /* behind the last zero byte: a text that begins before it ends */
+    std::vector<bool> text_starts;     /* by unit: a text begins there */
+    bool first_text_asked_for = false; /* by a reference that may as well mean that there is none */
+    std::size_t texts_end;             /* behind the last zero byte: a text that begins before it ends */
 };
 
 class walker {
@@ -165,6 +178,10 @@ public:
 
     /* While set, what would be an error is this warning: the compiler can make it of a careless source. */
     std::optional<check> excuse;
+
+    /* While set, a name that is 0 may mean that there is none, as other fields may: 0 is where the first text stands.
+     */
+    bool may_be_unset = true;
 
 private:
     void expect_reserved(const spot &at, const bytes &area, std::size_t offset, const field &f) {

@@ -137,6 +137,7 @@ template <class Record>
 void class_walk::follow_attribute(const spot &place, std::size_t offset, vx_uint32_t id, bool last) {
     auto type = section.number<vx_data_type_t>(offset + offsetof(Record, ra_data_type));
     bool may_be_cut_short = last && !is_last;
+    walk.may_be_unset = may_be_cut_short;
     bool may_be_astray = id == CDB_ID_DATTR && is_out_of_line(type);
     for (const field &f : leading_fields_of<Record>) {
         doubtful d = {place, &f, section.number<std::uint32_t>(offset + f.offset), type};
@@ -181,8 +182,9 @@ void class_walk::walk_attribute(const spot &place, std::size_t offset, vx_uint32
             walk.report(check::VARIABLE_TYPE, place, "ra_var_type", place.offset + offsetof(rsrc_dattr_t, ra_var_type),
                         std::to_string(record.ra_var_type), "0 to 3");
     }
+    met_shared = false;
     follow_attribute<Record>(place, offset, id, last);
-    if (element_type(record.ra_data_type) == VX_SD_PTR)
+    if (element_type(record.ra_data_type) == VX_SD_PTR && !met_shared)
         check_structure(place, record);
 }
 
@@ -292,8 +294,10 @@ std::optional<std::size_t> class_walk::claim_list(const spot &place, const field
         return std::nullopt;
     }
     std::size_t held = std::max(count, std::min<std::size_t>(room, 1));
-    if (lists.claim(offset, LIST_HEAD + held * format.entry) != extent::claim_result::FIRST)
+    if (lists.claim(offset, LIST_HEAD + held * format.entry) != extent::claim_result::FIRST) {
+        met_shared = true;
         return refuse(check::LIST_SHARED, "a list of its own");
+    }
     for (const field &f : format.fields.first(format.fields.size() - 1))
         walk.add_region(list_at, list_at.offset + f.offset, f.width, format.record, &f);
     if (count < held) {
@@ -331,6 +335,7 @@ void class_walk::walk_sd_definition(const spot &place, const field &ref, std::ui
     std::optional<std::size_t> first = claim_list(place, ref, offset, sd_defs, sd_format);
     if (!first)
         return;
+    bool owner_may_be_unset = std::exchange(walk.may_be_unset, false);
     auto count = sd_defs.area.number<std::uint32_t>(offset + LIST_COUNT);
     spot element = {at.section, "sd_field_t", 0, sd_defs.offset + *first};
     for (; element.index < count; ++element.index, element.offset += sizeof(sd_field_t)) {
@@ -340,6 +345,7 @@ void class_walk::walk_sd_definition(const spot &place, const field &ref, std::ui
         expect_data_type(element, "sd_field_type", offsetof(sd_field_t, sd_field_type), type);
         follow(element, sd_defs.area, in_table, leading_fields_of<sd_field_t>, type);
     }
+    walk.may_be_unset = owner_may_be_unset;
 }
 
 /* A source can leave lists that nothing refers to. */
@@ -367,12 +373,15 @@ void class_walk::run() {
     walk_attributes<rsrc_dattr_t>(rc.u_rc_dattrsC, rc.rc_num_dattrsC, "rsrc_dattr_t", CDB_ID_DATTR_C);
     walk_attributes<rsrc_pattr_t>(rc.u_rc_pattrs, rc.rc_num_pattrs, "rsrc_pattr_t", CDB_ID_PATTR);
     walk_attributes<rsrc_dattr_t>(rc.u_rc_dattrs, rc.rc_num_dattrs, "rsrc_dattr_t", CDB_ID_DATTR);
+    walk.may_be_unset = true;
     follow(at, section, 0, leading_fields_of<rsrc_class_t>, VX_UNKNOWN);
+    walk.may_be_unset = false;
     walk_actions(rc.u_rc_actionsC, rc.rc_num_actionsC, CDB_ID_ACTION_C);
     walk_actions(rc.u_rc_actions, rc.rc_num_actions, CDB_ID_ACTION);
     walk_errors();
     walk_depends();
     walk.finish_texts(at, strings); /* now all that has an owner without doubt is known */
+    walk.may_be_unset = true;
     walk_doubtful_lists();
     walk_doubtful_bounds();
     walk_empty_binaries();

@@ -87,6 +87,7 @@ private:
     extent variety_lists;
     extent sd_defs;
     unsigned nesting = 0;
+    bool met_shared = false;                 /* the attribute being walked led to a list or a value of another owner */
     std::vector<std::size_t> empty_binaries; /* ends of their lengths' pieces, in the strings */
     std::vector<doubtful> doubtful_lists;
     std::vector<doubtful> doubtful_bounds;

@@ -17,9 +17,12 @@ void class_walk::walk_container(const spot &place, std::string_view field, std::
     if (offset % extent::UNIT != 0)
         return walk.report(check::VALUE_UNALIGNED, place, field, file_offset, std::to_string(offset),
                            "a multiple of 8");
-    if (type == VX_CHAR_PTR)
+    if (type == VX_CHAR_PTR) {
+        if (!walk.excuse && strings.text_starts[offset / extent::UNIT])
+            return walk.report(check::VALUE_SHARED, place, field, file_offset, std::to_string(offset),
+                               "a value of its own");
         walk.note_text(at, strings, offset);
-    else if (type == VX_BINARY_PTR)
+    } else if (type == VX_BINARY_PTR)
         walk_binary(place, field, file_offset, offset);
     else if (type == VX_RSRC_HANDLE_PTR)
         walk_handle(place, field, file_offset, offset);
@@ -47,6 +50,7 @@ bool class_walk::claim_value(const spot &place, std::string_view field, std::siz
     if (strings.claim(offset, length) == extent::claim_result::FIRST)
         return true;
     walk.report(check::VALUE_SHARED, place, field, file_offset, std::to_string(offset), "a value of its own");
+    met_shared = true;
     return false;
 }
 

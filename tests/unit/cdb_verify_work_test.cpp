@@ -2,7 +2,7 @@
  * at more than once would be reported more than once, so the findings are counted: each image has one thing that much
  * refers to, and something wrong with each of its parts. */
 
-#include "cdb_view.h"
+#include "cdb_walk.h"
 
 #include "image_files.h"
 
@@ -184,7 +184,7 @@ TEST(CdbVerifyWork, OverlappingLists) {
                                          .valid_values = {},
                                          .strings = name}));
     EXPECT_EQ(count_of(findings, "CDB308"), 499u);
-    EXPECT_EQ(findings.size(), 499u);
+    EXPECT_EQ(findings.size(), 499u + 499u); /* and the name that all have */
 }
 
 /* The same from the end: each list overlaps the ones behind it, and claims 8 bytes before it sees so. */
@@ -225,8 +225,8 @@ TEST(CdbVerifyWork, StructuresThatShareStructures) {
                                          .structures = two_structures,
                                          .valid_values = {},
                                          .strings = twice_each(21)}));
-    EXPECT_EQ(count_of(findings, "CDB403"), 20u);
-    EXPECT_EQ(findings.size(), 20u);
+    EXPECT_EQ(count_of(findings, "CDB403"), 20u + 2u); /* and the elements' names */
+    EXPECT_EQ(findings.size(), 22u);
 }
 
 /* An array of 1000 references to one array of 1000: it is looked at once, its wrong cells are found once. */
@@ -244,7 +244,7 @@ TEST(CdbVerifyWork, ManyCellsOfOneValue) {
                                          .valid_values = {},
                                          .strings = strings}));
     EXPECT_EQ(count_of(findings, "CDB106"), 1000u);
-    EXPECT_EQ(count_of(findings, "CDB403"), 999u);
+    EXPECT_EQ(count_of(findings, "CDB403"), 999u + 2u); /* and the elements' names */
 }
 
 /* Names without end: that there is no zero byte is seen once, from the end of the strings. */
@@ -262,13 +262,12 @@ TEST(CdbVerifyWork, ManyNamesWithoutEnd) {
     EXPECT_FALSE(cdb::is_sound(findings));
 }
 
-/* Each attribute's structured data are compared with its definition. Here all attributes have the same ones, which is
- * wrong, and is said once for each. */
+/* Structured data are compared with their definition, here with a finding; but not again by those who share them. */
 TEST(CdbVerifyWork, ManyAttributesOfOneStructure) {
     words structures = {0x43444266, 100}, strings = name;
     append(strings, {100, 0});
     for (int i = 0; i < 100; ++i) {
-        append(structures, {0, 0, VX_INT32, 0, NONE, 0, 0, 0});
+        append(structures, {0, 0, i == 99 ? VX_UINT32 : VX_INT32, 0, NONE, 0, 0, 0});
         append(strings, {VX_INT32, 0, 1, 0});
     }
     auto findings = findings_of(file_of({.attributes = 100,
@@ -278,8 +277,30 @@ TEST(CdbVerifyWork, ManyAttributesOfOneStructure) {
                                          .structures = structures,
                                          .valid_values = {},
                                          .strings = strings}));
-    EXPECT_EQ(count_of(findings, "CDB403"), 99u);
-    EXPECT_EQ(findings.size(), 3u * 99);
+    EXPECT_EQ(count_of(findings, "CDB453"), 1u);
+    EXPECT_EQ(count_of(findings, "CDB403"), 99u + 99u + 100u); /* values; names of attributes and of elements */
+    EXPECT_EQ(count_of(findings, "CDB308"), 99u + 99u);        /* definitions, variety lists */
+    EXPECT_EQ(findings.size(), 1u + 298 + 198);
+}
+
+/* A text is looked at as far as it is new: neither one that begins amid another nor one that runs into another costs
+ * more than that, however long the other is. */
+TEST(CdbVerifyWork, TextsOverOneAnother) {
+    std::vector<std::byte> area(8 * 100, std::byte{'x'});
+    area[8 * 50 - 1] = std::byte{0};
+    cdb::extent strings(cdb::bytes(area, std::endian::native), 0);
+    auto long_one = strings.claim_text(8 * 10, area.size());
+    EXPECT_EQ(long_one.size, 8u * 40);
+    EXPECT_TRUE(long_one.whole);
+    auto amid = strings.claim_text(8 * 20, area.size());
+    EXPECT_EQ(amid.size, 0u);
+    EXPECT_FALSE(amid.whole);
+    auto into = strings.claim_text(8 * 8, area.size());
+    EXPECT_EQ(into.size, 8u * 2);
+    EXPECT_FALSE(into.whole);
+    auto to_its_limit = strings.claim_text(8 * 60, 8 * 64 - 3);
+    EXPECT_EQ(to_its_limit.size, 8u * 4 - 3);
+    EXPECT_FALSE(to_its_limit.whole);
 }
 
 /* ---- What is sound can be read to the end ----------------------------------------------------------------------- */

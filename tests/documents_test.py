@@ -11,7 +11,7 @@ import sys
 import tempfile
 import unittest
 
-from documents import DOCUMENTS, PAGES, PROJECT, sources
+from documents import DOCUMENTS, PAGES, PROJECT, sources, tables, text_of
 
 CDGEN = LIST_NAMES = ""
 WITH_SOURCES = {"README.md", "language.md", "format.md", "cdgen.1", "cdefsrc.5", "cdb.5"}
@@ -54,6 +54,28 @@ class Sources(unittest.TestCase):
         for path in sorted((PROJECT / "examples/projects").rglob("*.cdefsrc")):
             with self.subTest(path.name):
                 self.compile(path.read_text())
+
+
+class Tables(unittest.TestCase):
+    """What becomes of a document's tables on its page."""
+
+    def shown(self, cell):
+        """A cell as the page has it, without fonts."""
+        return re.escape(re.sub(r"\[([^\]]*)\]\([^)]*\)", r"\1", cell).replace("`", "").replace(r"\|", "|"))
+
+    def test_each_has_its_headings_on_the_page(self):
+        for document, page in (("language.md", "cdefsrc.5"), ("format.md", "cdb.5")):
+            text, at = text_of(PROJECT / "man" / page), 0
+            for head, *rows in tables((PROJECT / "docs" / document).read_text()):
+                if len(head) > 1:
+                    heads = [self.shown(cell) for cell in head]
+                    found = re.compile(rf"^(?:{heads[0]}\n{heads[-1]}|{chr(9).join(heads)})$", re.M).search(text, at)
+                    self.assertIsNotNone(found, f"{page}: {head}")
+                    at = found.end()
+
+    def test_no_cell_is_named_that_is_empty(self):
+        for page in PAGES:
+            self.assertNotRegex(page.read_text(), r"(?m)\\fI[^\n]*\\fR: *$", page.name)
 
 
 class Links(unittest.TestCase):

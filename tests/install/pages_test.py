@@ -6,7 +6,7 @@ import re
 import subprocess
 import unittest
 
-from installed import run, tree
+from installed import Case, program, run, tree
 from understood import options, options_of_cdgen, subcommands
 
 
@@ -31,6 +31,24 @@ class Pages(unittest.TestCase):
             name, section = page.name.split(".")
             shown = run("man", "--manpath", tree() / "share/man", section, name)
             self.assertIn(f"{name.upper()}({section})", shown)
+
+
+class Copied(Case):
+    """Who copies the class from the page, as a terminal shows it, has a source."""
+
+    def compile(self, shown):
+        chapter = re.search(r"^A WHOLE CLASS\n(.*?)^LINES$", shown, re.M | re.S).group(1)
+        (self.here / "Printer.cdefsrc").write_text(chapter[re.search(r"^#", chapter, re.M).start():])
+        run(program("cdgen"), "Printer.cdefsrc", "Printer.cdef", cwd=self.here)
+        self.assertIn("PrintTestPage", run(program("cdef"), "dump", "Printer.cdef", cwd=self.here))
+
+    def test_from_man(self):
+        page = tree() / "share/man/man5/cdefsrc.5"
+        self.compile(run("man", "--local-file", page, env={**os.environ, "MANWIDTH": "80"}))
+
+    def test_from_mandoc(self):
+        page = tree() / "share/man/man5/cdefsrc.5"
+        self.compile(re.sub(".\x08", "", run("mandoc", "-T", "ascii", page)))
 
 
 class Options(unittest.TestCase):

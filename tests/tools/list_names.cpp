@@ -2,12 +2,14 @@
  * documents, completions and editor files against them. The first word says what the rest is:
  *
  *   stanza NAME
- *   attribute STANZA NAME required|optional once|repeats
- *   property class|persistent|dynamic|action NAME
- *   permission LETTER
+ *   attribute STANZA NAME required|optional once|repeats FORM
+ *   property class|persistent|dynamic|action NAME BIT
+ *   permission LETTER MASK
  *   type NAME
  *   variable NAME
  *   field RECORD NAME
+ *
+ * FORM is the form of the value, as the language's document calls it: words, or nothing where every value is refused.
  */
 
 #include "cdb_fields.h"
@@ -17,19 +19,71 @@
 
 namespace {
 
+const char *form_of(int type) {
+    switch (type) {
+    case AT_UINT16:
+    case AT_VALUE_DISPLAY:
+    case AT_SD_DESCRIPTION:
+    case AT_SD_DISPLAY:
+    case AT_SD_VALUE_DISPLAY:
+        return "number16";
+    case AT_ID:
+        return "number32";
+    case AT_STRING:
+    case AT_MANAGER:
+    case AT_LOCATOR:
+    case AT_SD_NAME:
+        return "text";
+    case AT_CLASS_PROPS:
+    case AT_PATTR_PROPS:
+    case AT_DATTR_PROPS:
+    case AT_ACTION_PROPS:
+        return "names";
+    case AT_VERSION:
+        return "version";
+    case AT_VARIETY:
+        return "low,high";
+    case AT_RANGE:
+        return "two values with ,: low,high";
+    case AT_DATA_TYPE:
+    case AT_SD_DATA_TYPE:
+        return "type";
+    case AT_VARIABLE_TYPE:
+        return "Counter, Quantity, State or Quantum";
+    case AT_DEFAULT_VALUE:
+    case AT_INITIAL_VALUE:
+        return "value";
+    case AT_VALID_VALUE:
+    case AT_SD_VALID_VALUE:
+        return "value(s)";
+    case AT_SD_INDEX:
+        return "decimal number";
+    case AT_PERMISSION:
+        return "a letter";
+    case AT_PERM_TEMPLATE:
+    case AT_LIST_ACTION_CLASS:
+    case AT_LIST_ACTION_RSRC:
+        return "anything";
+    case AT_SD_DEFAULT_VALUE:
+        return "";
+    default:
+        return "of no name";
+    }
+}
+
 void list_stanzas() {
     for (const srtable_ctrl &stanza : std::span(sc_tables).first(SC_COUNT))
         std::printf("stanza %s\n", stanza.sc_name);
     for (const srtable_ctrl &stanza : std::span(sc_tables).first(SC_COUNT))
         for (const table_attrs &attr : stanza.sc_attrs)
-            std::printf("attribute %s %s %s %s\n", stanza.sc_name, attr.ta_name,
+            std::printf("attribute %s %s %s %s %s\n", stanza.sc_name, attr.ta_name,
                         (attr.req_bit & OPTIONAL) != 0 ? "optional" : "required",
-                        attr.dup_allowed != 0 ? "repeats" : "once");
+                        attr.dup_allowed != 0 ? "repeats" : "once", form_of(attr.ta_type));
 }
 
 void list_properties(const char *of, std::span<const props_t> props) {
     for (const props_t &prop : props)
-        std::printf("property %s %s\n", of, prop.s);
+        std::printf("property %s %s 0x%x\n", of, prop.s, prop.p);
 }
 
 void list_words() {
@@ -38,7 +92,7 @@ void list_words() {
     list_properties("dynamic", da_props);
     list_properties("action", act_props);
     for (const valid_perms_t &perm : perm_list)
-        std::printf("permission %c\n", perm.permission);
+        std::printf("permission %c 0x%x\n", perm.permission, perm.mask);
     for (vx_data_type_t type : vxTypeMap)
         if (type != VX_UNKNOWN) /* which no source may name */
             std::printf("type %s\n", vxTypeStr[type]);

@@ -1,6 +1,8 @@
 """What is installed, and where."""
 
+import ctypes
 import os
+import shlex
 import unittest
 
 from installed import BUILD, EXAMPLES, Case, only, pkg_config_environment, program, run, tree
@@ -38,6 +40,28 @@ class Tree(Case):
         run("cmake", "--install", BUILD, "--prefix", "/some/prefix", env={**os.environ, "DESTDIR": str(self.here)})
         self.assertTrue((self.here / "some/prefix/bin/cdgen").is_file())
         self.assertEqual([path.name for path in self.here.iterdir()], ["some"])
+
+
+PLUGIN = r"""
+#include "cdb_view.h"
+extern "C" int is_sound(const char *name) {
+    std::error_code error;
+    std::vector<std::byte> file = cdb::read_file(name, error);
+    return !error && cdb::is_sound(cdb::verify(cdb::database(file)));
+}
+"""
+
+
+class Shared(Case):
+    def test_library_can_be_part_of_a_shared_one(self):
+        """A plug-in, say of an interpreter, is one."""
+        (self.here / "plugin.cpp").write_text(PLUGIN)
+        flags = shlex.split(run("pkg-config", "--cflags", "--libs", "cdgen", env=pkg_config_environment()))
+        run("c++", "-std=c++20", "-fPIC", "-shared", "-Wl,--no-undefined", "plugin.cpp", "-o", "plugin.so", *flags,
+            cwd=self.here)
+        run(program("cdgen"), EXAMPLES / "FileSystem.cdefsrc", self.here / "a.cdef")
+        plugin = ctypes.CDLL(str(self.here / "plugin.so"))
+        self.assertEqual([plugin.is_sound(os.fsencode(self.here / name)) for name in ("a.cdef", "plugin.cpp")], [1, 0])
 
 
 class PkgConfig(unittest.TestCase):

@@ -3,7 +3,7 @@
 import json
 import unittest
 
-from installed import EXAMPLES, Case, run, tree
+from installed import Case, examples, run, tree
 
 SOURCE = """ControlDefinition
 	FileVersion=1.0.0.0
@@ -67,7 +67,7 @@ class Vim(Case):
         ])
 
     def test_shows_no_mistake_in_the_examples(self):
-        for example in sorted(EXAMPLES.glob("*.cdefsrc")):
+        for example in sorted(examples().glob("*.cdefsrc")):
             groups = {name for line in self.groups(example.read_text()) for name in line}
             self.assertIn("cdefStanza", groups)
             self.assertFalse({"cdefUnknownStanza", "cdefUnknownAttribute", "cdefNoAttribute"} & groups, example.name)

@@ -5,12 +5,12 @@ import os
 import shlex
 import unittest
 
-from installed import BUILD, EXAMPLES, Case, only, pkg_config_environment, program, run, tree
+from installed import BUILD, Case, examples, only, pkg_config_environment, program, run, tree
 
 
 class Tree(Case):
     def test_programs_run(self):
-        run(program("cdgen"), EXAMPLES / "FileSystem.cdefsrc", self.here / "a.cdef")
+        run(program("cdgen"), examples() / "FileSystem.cdefsrc", self.here / "a.cdef")
         self.assertEqual(run(program("cdef"), "verify", self.here / "a.cdef"), "")
 
     def test_has_the_four_headers_and_no_other(self):
@@ -59,7 +59,7 @@ class Shared(Case):
         flags = shlex.split(run("pkg-config", "--cflags", "--libs", "cdgen", env=pkg_config_environment()))
         run("c++", "-std=c++20", "-fPIC", "-shared", "-Wl,--no-undefined", "plugin.cpp", "-o", "plugin.so", *flags,
             cwd=self.here)
-        run(program("cdgen"), EXAMPLES / "FileSystem.cdefsrc", self.here / "a.cdef")
+        run(program("cdgen"), examples() / "FileSystem.cdefsrc", self.here / "a.cdef")
         plugin = ctypes.CDLL(str(self.here / "plugin.so"))
         self.assertEqual([plugin.is_sound(os.fsencode(self.here / name)) for name in ("a.cdef", "plugin.cpp")], [1, 0])
 

@@ -66,15 +66,20 @@ class Compile:
         self.build()
         self.assertEqual((self.here / "b/a.cdef").stat().st_ino, before.st_ino)
 
-    def test_changed_compiler_compiles_again(self):
+    def project_with_a_tree_of_its_own(self):
+        """A project that uses a copy of the installed tree; returns the compiler in it."""
         copy = self.here / "tree"
-        shutil.copytree(tree(), copy)
+        shutil.copytree(tree(), copy, symlinks=True)
         (self.here / "a.cdefsrc").write_bytes(disk().read_bytes())
         (self.here / "CMakeLists.txt").write_text(HEAD + "cdgen_compile(disk a.cdefsrc a.cdef)")
         run("cmake", "-G", self.GENERATOR, "-S", self.here, "-B", self.here / "b", found_in(copy))
+        return copy / "bin/cdgen"
+
+    def test_changed_compiler_compiles_again(self):
+        compiler = self.project_with_a_tree_of_its_own()
         self.build()
         before = (self.here / "b/a.cdef").stat()
-        later(copy / "bin/cdgen")
+        later(compiler)
         self.build()
         self.assertNotEqual((self.here / "b/a.cdef").stat().st_ino, before.st_ino)
 
@@ -85,6 +90,33 @@ class Compile:
         self.assertIn(f"{self.here}/a.cdefsrc:2: error: Attribute name not defined in table", str(failed.exception))
         self.assertFalse((self.here / "b/a.cdef").exists())
         self.assertEqual(self.leftovers(), [])
+
+    def test_failure_shows_all_that_cdgen_says(self):
+        """Some of its messages have a part on standard output."""
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=b"ControlDefinition\n\tFileVersion=\n")
+        with self.assertRaises(AssertionError) as failed:
+            self.build()
+        self.assertRegex(str(failed.exception), r"In file .*a\.cdefsrc: *\n.*:2: error: Missing attribute value: ")
+
+    def test_what_a_killed_build_left_behind_is_cleared(self):
+        compiler = self.project_with_a_tree_of_its_own()
+        real = compiler.rename(compiler.with_name("real"))
+        compiler.write_text("#!/bin/sh\nfor to; do :; done\nprintf half >\"$to\"\nkill -9 $PPID\n")
+        compiler.chmod(0o755)
+        self.assertRaises(AssertionError, self.build)
+        (left,) = (self.here / "b").rglob(".cdgen-*")
+        self.assertEqual((left / "a.cdef").read_bytes(), b"half")
+        real.replace(compiler)
+        self.build()
+        self.assertEqual(self.leftovers(), [])
+        self.assertIn(b"BlockSize", self.made("a.cdef"))
+
+    def test_names_that_a_target_cannot_tell_apart(self):
+        names = ("a-b.cdef", "a_b.cdef", "a b.cdef", "a/b.cdef")
+        self.project("\n".join(f'cdgen_compile(all_db a.cdefsrc "{name}")' for name in names), a=disk().read_bytes())
+        self.build()
+        for name in names:
+            self.assertIn(b"BlockSize", self.made(name))
 
     def test_failure_is_tried_again(self):
         self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=disk().read_bytes())

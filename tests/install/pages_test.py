@@ -7,7 +7,7 @@ import subprocess
 import unittest
 
 from installed import Case, program, run, tree
-from understood import options, options_of_cdgen, subcommands
+from understood import options, options_of_cdgen, subcommands, values
 
 
 class Pages(unittest.TestCase):
@@ -69,6 +69,10 @@ class Options(unittest.TestCase):
         self.assertEqual(shared, options())
         for subcommand in subcommands():
             self.assertEqual(said[subcommand] | {"-h", "--help"}, options(subcommand), subcommand)
+
+    def test_names_of_warnings(self):
+        said = self.page("cdef").split("explains, are\n")[1].split(".It ")[0]
+        self.assertEqual(set(re.findall(r"^\.Cm (\S+)", said, re.M)) | {"all"}, values("check")["--warn"])
 
     def options_in(self, text):
         return {f"-{name}" for line in re.findall(r"^\.It Fl (.*)", text, re.M) for name in line.split(" , ")}

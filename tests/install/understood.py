@@ -27,6 +27,12 @@ def subcommands():
     return set(re.findall(r"^  ([a-z]\S*)", help_of().split("Subcommands:\n")[1], re.M))
 
 
+def values(*words):
+    """The words that an option can have, of each option that lists them in a help text."""
+    listed = re.findall(r"^  (-\S+) [A-Z]+:\{([^}]*)\}", help_of(*words), re.M)
+    return {option: set(found.split(",")) for option, found in listed}
+
+
 def options(*words):
     """All spellings of the options in a help text."""
     return {spelling for line in re.findall(r"^  (-\S+)", help_of(*words), re.M) for spelling in line.split(",")}

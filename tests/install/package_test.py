@@ -1,12 +1,17 @@
 """The Debian package: what Debian's checker says, and installing, running and removing it in a root of its own."""
 
+import os
 import pathlib
 import shutil
 import subprocess
+import sys
 import tempfile
 import unittest
 
 from installed import BUILD, PROJECT, Case, run
+
+sys.path.insert(0, str(PROJECT / "tests"))
+from documents import broken_links
 
 
 class Package(Case):
@@ -32,6 +37,8 @@ class Package(Case):
         example = self.here / "usr/share/doc/cdgen/examples/FileSystem.cdefsrc"
         run(self.here / "usr/bin/cdgen", example, self.here / "a.cdef")
         self.assertEqual(run(self.here / "usr/bin/cdef", "verify", self.here / "a.cdef"), "")
+        for document in (self.here / "usr/share/doc/cdgen").rglob("*.md"):
+            self.assertEqual(broken_links(document), [], document.name)
         run(*dpkg, "--remove", "cdgen")
         self.assertFalse(list((self.here / "usr").rglob("*")) if (self.here / "usr").exists() else [])
 
@@ -40,8 +47,8 @@ class Package(Case):
 
 
 class Reproducible(Case):
-    def test_place_of_the_build_does_not_matter(self):
-        """Another source directory and another build directory give the same programs, byte for byte."""
+    def test_place_and_time_of_the_build_do_not_matter(self):
+        """Another source directory and another build directory give the same packages, byte for byte."""
         copy = self.here / "another place for the sources"
         files = subprocess.run(["git", "ls-files", "-z", "--cached", "--others", "--exclude-standard"], cwd=PROJECT,
                                check=True, capture_output=True, text=True).stdout
@@ -53,6 +60,17 @@ class Reproducible(Case):
         run("cmake", "--build", build)
         for name in ("cdgen", "cdef", "libcdb_view.a"):
             self.assertTrue((build / name).read_bytes() == (BUILD / name).read_bytes(), name)
+        for generator, pattern in (("DEB", "*.deb"), ("TGZ", "*.tar.gz")):
+            here, there = (self.package(place, generator, pattern) for place in (BUILD, build))
+            self.assertTrue(here == there, pattern)
+
+    def package(self, build, generator, pattern):
+        """The bytes of the package, without what the environment says of the time."""
+        environment = {name: value for name, value in os.environ.items() if name != "SOURCE_DATE_EPOCH"}
+        with tempfile.TemporaryDirectory(dir=self.here) as place:
+            run("cpack", "-G", generator, "-B", place, cwd=build, env=environment)
+            (made,) = pathlib.Path(place).glob(pattern)
+            return made.read_bytes()
 
 
 if __name__ == "__main__":

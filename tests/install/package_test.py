@@ -42,6 +42,16 @@ class Package(Case):
         run(*dpkg, "--remove", "cdgen")
         self.assertFalse(list((self.here / "usr").rglob("*")) if (self.here / "usr").exists() else [])
 
+    def test_names_who_made_it(self):
+        """SECURITY.md sends reports there."""
+        maintainer = "A Packager <packager@packages.example>"
+        run("cpack", "-G", "DEB", "-B", self.here, "-D", f"CPACK_PACKAGE_CONTACT={maintainer}", cwd=BUILD)
+        (package,) = self.here.glob("*.deb")
+        self.assertEqual(run("dpkg-deb", "--field", package, "Maintainer").strip(), maintainer)
+        run("dpkg-deb", "--extract", package, self.here / "root")
+        changes = run("zcat", self.here / "root/usr/share/doc/cdgen/changelog.Debian.gz")
+        self.assertIn(f"\n -- {maintainer}  ", changes)
+
     def test_says_what_its_programs_need(self):
         self.assertIn("libstdc++6", run("dpkg-deb", "--field", self.package, "Depends"))
 

@@ -1,6 +1,6 @@
 # Packages for cpack: a Debian package and an archive.
 
-# The day of the release in seconds since 1970, 2026-11-21. All that a package holds has this time, so that two packages
+# The day of the release in seconds since 1970. All that a package holds has this time, so that two packages
 # of the same sources are the same bytes; cpack takes another one from the environment, as packagers have it there.
 set(CPACK_CDGEN_RELEASED 1795219200)
 set(CPACK_PROJECT_CONFIG_FILE "${PROJECT_SOURCE_DIR}/cmake/package_time.cmake")

@@ -4,6 +4,7 @@
     documents_test.py CDGEN LIST_NAMES
 """
 
+import datetime
 import pathlib
 import re
 import subprocess
@@ -87,6 +88,29 @@ class Links(unittest.TestCase):
         index = (PROJECT / "docs/README.md").read_text()
         for path in DOCUMENTS:
             self.assertIn(f"{path.name})", index, path.name)
+
+
+class Release(unittest.TestCase):
+    def found(self, name, expression):
+        """What the expression's group is in a file, which is there once."""
+        (value,) = re.findall(expression, (PROJECT / name).read_text(), re.M)
+        return value
+
+    def test_version_is_the_same_wherever_it_stands(self):
+        version = self.found("CMakeLists.txt", r"^project\(cdgen VERSION (\S+)")
+        self.assertEqual(self.found("editors/vscode/package.json", r'^  "version": "(.*)"'), version)
+        self.assertRegex((PROJECT / "CHANGELOG.md").read_text(), rf"(?m)^## {re.escape(version)},")
+
+    def test_nothing_else_asks_for_a_version(self):
+        for path in (*DOCUMENTS, *(PROJECT / "examples").rglob("CMakeLists.txt")):
+            self.assertNotRegex(path.read_text(), r"find_package\(cdgen \d", path)
+
+    def test_date_is_the_same_wherever_it_stands(self):
+        seconds = int(self.found("cmake/package.cmake", r"^set\(CPACK_CDGEN_RELEASED (\d+)\)"))
+        day = datetime.datetime.fromtimestamp(seconds, datetime.timezone.utc)
+        self.assertEqual(self.found("man/from_markdown.py", r'^DATE = "(.*?)"'), f"{day:%Y-%m-%d}")
+        for page in ("man/cdgen.1", "man/cdef.1"):
+            self.assertEqual(self.found(page, r"^\.Dd (.*)"), f"{day:%B} {day.day}, {day.year}")
 
 
 class Made(unittest.TestCase):

@@ -47,12 +47,12 @@ ClassToManagerMapping # z
 	MessageCatalog=mgr1.cat
 	DescriptiveMessageSet=1
 """
-# None of these does, whatever stands before it; each with the kind of mistake that it is.
+# None of these does, put in front of the last stanza; each with the kind of mistake that it is.
 WRONG = [
     ("/ResourceClass", "stanza"), ("ResourceClass/", "stanza"), ("ResourceClas", "stanza"),
-    ('"" ResourceClass', "stanza"), ('" // x', "stanza"), ("\tNam # a=b", "no value"), ("\tNam // a=b", "no value"), ("\tName", "no value"),
-    ("\tNam=1", "attribute"), ("\tName =1", "attribute"), ("\t/Name=1", "attribute"), ("\tFirstKey=1", "attribute"),
-    ('\tNam="" x', "attribute"),
+    ('"" ResourceClass', "stanza"), ('" // x', "stanza"), ("\tNam # a=b", "no value"),
+    ("\tNam // a=b", "no value"), ("\tName", "no value"), ("\tNam=1", "attribute"), ("\tName =1", "attribute"),
+    ("\t/Name=1", "attribute"), ("\tFirstKey=1", "attribute"), ('\tNam="" x', "attribute"),
 ]
 
 
@@ -70,7 +70,10 @@ def right_sources(place):
 
 
 def wrong_sources():
-    return [(f"ControlDefinition\n\tFileVersion=1.0.0.0\nResourceClass\n{line}\n", kind) for line, kind in WRONG]
+    """Each with the mistake that is to be found in it: the line's number, and the kind."""
+    before, header, after = RIGHT.partition("ClassToManagerMapping")
+    at = before.count("\n") + 1
+    return [(f"{before}{line}\n{header}{after}", (at, kind)) for line, kind in WRONG]
 
 
 class Vim(Case):
@@ -80,7 +83,8 @@ class Vim(Case):
         out = self.here / "said"
         run("vim", "-u", "NONE", "-N", "-i", "NONE", "-es",
             "--cmd", f"let &runtimepath = '{tree()}/share/cdgen/editors/vim,' . &runtimepath",
-            "-c", "filetype plugin on", "-c", "syntax on", "-c", f"edit {file}", "-c", "let said = []", "-S", self.here / "ask.vim",
+            "-c", "filetype plugin on", "-c", "syntax on", "-c", f"edit {file}",
+            "-c", "let said = []", "-S", self.here / "ask.vim",
             "-c", f"call writefile(said, '{out}')", "-c", "qall!", cwd=self.here)
         return out.read_text().splitlines()
 
@@ -153,8 +157,9 @@ class Vim(Case):
 
     def test_shows_each_mistake(self):
         sources = wrong_sources()
-        for (source, kind), mistakes in zip(sources, self.mistakes([source for source, _ in sources])):
-            self.assertEqual(mistakes, [(4, kind)], source)
+        for (source, mistake), found in zip(sources, self.mistakes([source for source, _ in sources])):
+            self.assertFalse(compiles(self.here, source.encode()), source)
+            self.assertEqual(found, [mistake], source)
 
     def test_make_checks_the_file(self):
         (self.here / "a.cdefsrc").write_text(SOURCE)
@@ -240,8 +245,8 @@ class TextMate(Case):
         self.assertEqual(self.mistakes(RIGHT), [])
 
     def test_shows_each_mistake(self):
-        for source, kind in wrong_sources():
-            self.assertEqual(self.mistakes(source), [(4, kind)], source)
+        for source, mistake in wrong_sources():
+            self.assertEqual(self.mistakes(source), [mistake], source)
 
     def test_every_rule_that_is_included_exists(self):
         included = [name for name in json.dumps(self.grammar).split('"') if name.startswith("#")]

@@ -19,56 +19,49 @@
 
 namespace {
 
+struct form {
+    int type; /* attr_type */
+    const char *name;
+};
+
+constexpr form forms[] = {
+    {AT_UINT16, "number16"},
+    {AT_VALUE_DISPLAY, "number16"},
+    {AT_SD_DESCRIPTION, "number16"},
+    {AT_SD_DISPLAY, "number16"},
+    {AT_SD_VALUE_DISPLAY, "number16"},
+    {AT_ID, "number32"},
+    {AT_STRING, "text"},
+    {AT_MANAGER, "text"},
+    {AT_LOCATOR, "text"},
+    {AT_SD_NAME, "text"},
+    {AT_CLASS_PROPS, "names"},
+    {AT_PATTR_PROPS, "names"},
+    {AT_DATTR_PROPS, "names"},
+    {AT_ACTION_PROPS, "names"},
+    {AT_VERSION, "version"},
+    {AT_VARIETY, "low,high"},
+    {AT_RANGE, "two values with ,: low,high"},
+    {AT_DATA_TYPE, "type"},
+    {AT_SD_DATA_TYPE, "type"},
+    {AT_VARIABLE_TYPE, "Counter, Quantity, State or Quantum"},
+    {AT_DEFAULT_VALUE, "value"},
+    {AT_INITIAL_VALUE, "value"},
+    {AT_VALID_VALUE, "value(s)"},
+    {AT_SD_VALID_VALUE, "value(s)"},
+    {AT_SD_INDEX, "decimal number"},
+    {AT_PERMISSION, "a letter"},
+    {AT_PERM_TEMPLATE, "anything"},
+    {AT_LIST_ACTION_CLASS, "anything"},
+    {AT_LIST_ACTION_RSRC, "anything"},
+    {AT_SD_DEFAULT_VALUE, ""},
+};
+
 const char *form_of(int type) {
-    switch (type) {
-    case AT_UINT16:
-    case AT_VALUE_DISPLAY:
-    case AT_SD_DESCRIPTION:
-    case AT_SD_DISPLAY:
-    case AT_SD_VALUE_DISPLAY:
-        return "number16";
-    case AT_ID:
-        return "number32";
-    case AT_STRING:
-    case AT_MANAGER:
-    case AT_LOCATOR:
-    case AT_SD_NAME:
-        return "text";
-    case AT_CLASS_PROPS:
-    case AT_PATTR_PROPS:
-    case AT_DATTR_PROPS:
-    case AT_ACTION_PROPS:
-        return "names";
-    case AT_VERSION:
-        return "version";
-    case AT_VARIETY:
-        return "low,high";
-    case AT_RANGE:
-        return "two values with ,: low,high";
-    case AT_DATA_TYPE:
-    case AT_SD_DATA_TYPE:
-        return "type";
-    case AT_VARIABLE_TYPE:
-        return "Counter, Quantity, State or Quantum";
-    case AT_DEFAULT_VALUE:
-    case AT_INITIAL_VALUE:
-        return "value";
-    case AT_VALID_VALUE:
-    case AT_SD_VALID_VALUE:
-        return "value(s)";
-    case AT_SD_INDEX:
-        return "decimal number";
-    case AT_PERMISSION:
-        return "a letter";
-    case AT_PERM_TEMPLATE:
-    case AT_LIST_ACTION_CLASS:
-    case AT_LIST_ACTION_RSRC:
-        return "anything";
-    case AT_SD_DEFAULT_VALUE:
-        return "";
-    default:
-        return "of no name";
-    }
+    for (const form &f : forms)
+        if (f.type == type)
+            return f.name;
+    return "of no name";
 }
 
 void list_stanzas() {

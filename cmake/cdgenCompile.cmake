@@ -29,11 +29,14 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
     COMMENT "Compiling class definition ${shown}"
     VERBATIM)
 
-  # One target for each database: with two, a parallel make would run the command in both.
+  # One target for each database: with two, a parallel make would run the command in both. Names that differ in what a
+  # target's name cannot hold (a-b, a_b) differ in the hash.
   if(NOT TARGET "${TARGET}")
     add_custom_target("${TARGET}" ALL DEPENDS "${OUTPUT}")
   else()
-    string(MAKE_C_IDENTIFIER "${TARGET}_${shown}" part)
+    string(MD5 hash "${shown}")
+    string(SUBSTRING "${hash}" 0 8 hash)
+    string(MAKE_C_IDENTIFIER "${TARGET}_${shown}_${hash}" part)
     add_custom_target("${part}" DEPENDS "${OUTPUT}")
     add_dependencies("${TARGET}" "${part}")
   endif()

@@ -18,16 +18,18 @@ License: Apache-2.0
  /usr/share/common-licenses/Apache-2.0.
 ")
 
+string(TIMESTAMP released "%a, %d %b %Y %H:%M:%S +0000" UTC) # SOURCE_DATE_EPOCH, which package_time.cmake has set
 file(WRITE "${doc}/changelog.Debian"
   "${CPACK_PACKAGE_NAME} (${CPACK_PACKAGE_VERSION}-${CPACK_DEBIAN_PACKAGE_RELEASE}) unstable; urgency=medium
 
   * What is new stands in changelog.gz.
 
- -- ${CPACK_PACKAGE_CONTACT}  ${CPACK_CDGEN_RELEASED}
+ -- ${CPACK_PACKAGE_CONTACT}  ${released}
 ")
 
-# Pages and changes are compressed, without a time, so that equal builds make equal packages.
-file(RENAME "${doc}/CHANGELOG.md" "${doc}/changelog")
+# Pages and changes are compressed, without a time, so that equal builds make equal packages. The changes also stay as
+# they are: other documents have links to them.
+file(COPY_FILE "${doc}/CHANGELOG.md" "${doc}/changelog")
 file(GLOB pages "${share}/man/man*/*")
 foreach(file IN LISTS pages ITEMS "${doc}/changelog" "${doc}/changelog.Debian")
   execute_process(COMMAND gzip -9n "${file}" COMMAND_ERROR_IS_FATAL ANY)

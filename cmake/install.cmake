@@ -7,10 +7,12 @@ set(package_dir "${CMAKE_INSTALL_LIBDIR}/cmake/cdgen")
 set(headers vx.h cdb.h cdb_fields.h cdb_view.h)
 list(TRANSFORM headers PREPEND "${PROJECT_SOURCE_DIR}/include/")
 
-install(TARGETS cdgen cdb_view EXPORT cdgenTargets)
+set(programs cdgen)
 if(TARGET cdef)
-  install(TARGETS cdef EXPORT cdgenTargets)
+  list(APPEND programs cdef)
 endif()
+
+install(TARGETS ${programs} cdb_view EXPORT cdgenTargets)
 target_include_directories(cdb_view INTERFACE "$<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}/cdgen>")
 install(FILES ${headers} DESTINATION "${CMAKE_INSTALL_INCLUDEDIR}/cdgen")
 
@@ -39,21 +41,33 @@ else()
   set(pc_prefix "\${pcfiledir}/${up}")
   string(REGEX REPLACE "/$" "" pc_prefix "${pc_prefix}")
 endif()
+set(pc_cdef "")
+if(TARGET cdef)
+  set(pc_cdef "cdef=\${bindir}/cdef\n")
+endif()
 configure_file(cmake/cdgen.pc.in cdgen.pc @ONLY)
 install(FILES "${CMAKE_CURRENT_BINARY_DIR}/cdgen.pc" DESTINATION "${CMAKE_INSTALL_LIBDIR}/pkgconfig")
 
 # For people.
-install(FILES man/cdgen.1 man/cdef.1 DESTINATION "${CMAKE_INSTALL_MANDIR}/man1")
+foreach(program IN LISTS programs)
+  install(FILES man/${program}.1 DESTINATION "${CMAKE_INSTALL_MANDIR}/man1")
+endforeach()
 install(FILES man/cdefsrc.5 man/cdb.5 DESTINATION "${CMAKE_INSTALL_MANDIR}/man5")
 install(FILES README.md CHANGELOG.md CONTRIBUTING.md LICENSE SECURITY.md DESTINATION "${CMAKE_INSTALL_DOCDIR}")
 install(DIRECTORY docs examples DESTINATION "${CMAKE_INSTALL_DOCDIR}")
+
+# Links of the documents to ../include lead to the headers.
+file(RELATIVE_PATH headers_of_docs "${CMAKE_INSTALL_FULL_DOCDIR}" "${CMAKE_INSTALL_FULL_INCLUDEDIR}/cdgen")
+file(MAKE_DIRECTORY "${CMAKE_CURRENT_BINARY_DIR}/doc")
+file(CREATE_LINK "${headers_of_docs}" "${CMAKE_CURRENT_BINARY_DIR}/doc/include" SYMBOLIC)
+install(FILES "${CMAKE_CURRENT_BINARY_DIR}/doc/include" DESTINATION "${CMAKE_INSTALL_DOCDIR}")
 
 # For editors, which have no common place.
 install(DIRECTORY editors/vim editors/vscode DESTINATION "${CMAKE_INSTALL_DATADIR}/cdgen/editors")
 
 # For shells.
 set(CDGEN_ZSH_DIR "${CMAKE_INSTALL_DATADIR}/zsh/site-functions" CACHE STRING "Where zsh looks for completions")
-foreach(program IN ITEMS cdgen cdef)
+foreach(program IN LISTS programs)
   install(FILES completions/${program}.bash DESTINATION "${CMAKE_INSTALL_DATADIR}/bash-completion/completions"
     RENAME ${program})
   install(FILES completions/_${program} DESTINATION "${CDGEN_ZSH_DIR}")

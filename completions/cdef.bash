@@ -1,11 +1,17 @@
 # bash completion for cdef; what it understands is taken from its own help
 
 _cdef() {
-    local word subcommand=
+    local word subcommand='' values=''
     for word in "${COMP_WORDS[@]:1:COMP_CWORD-1}"; do
         [[ $word != -* ]] && subcommand=$word && break
     done
-    if [[ $2 == -* ]]; then
+    if [[ $3 == --* ]]; then
+        values=$("$1" ${subcommand:+"$subcommand"} --help 2>/dev/null |
+            sed -nE "s/^  $3 [A-Z]+:\{([^}]*)\}.*/\1/p" | tr , ' ')
+    fi
+    if [[ $values ]]; then
+        mapfile -t COMPREPLY < <(compgen -W "$values" -- "$2")
+    elif [[ $2 == -* ]]; then
         local options
         options=$("$1" ${subcommand:+"$subcommand"} --help 2>/dev/null | sed -n 's/^  \(-[^ ]*\).*/\1/p' | tr , ' ')
         mapfile -t COMPREPLY < <(compgen -W "$options" -- "$2")

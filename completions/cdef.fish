@@ -13,7 +13,14 @@ function __cdef_options
         -e 's/^  ([^, ]*),?[^ ]* */\1\t/p' -e g -e 's/^  [^, ]*,([^, ]*) */\1\t/p'
 end
 
+function __cdef_values
+    set -l option (commandline -opc)[-1]
+    string match --quiet -- '--*' $option
+    and cdef (__cdef_subcommand) --help 2>/dev/null | sed -nE "s/^  $option [A-Z]+:\{([^}]*)\}.*/\1/p" | string split ,
+end
+
 complete -c cdef -f
+complete -c cdef -n 'test -n "$(__cdef_values)"' -a '(__cdef_values)'
 complete -c cdef -n 'test -z "$(__cdef_subcommand)"' -a '(__cdef_subcommands)'
-complete -c cdef -k -n 'test -n "$(__cdef_subcommand)"' -a '(__fish_complete_suffix .cdef)'
+complete -c cdef -k -n 'test -n "$(__cdef_subcommand)"; and test -z "$(__cdef_values)"' -a '(__fish_complete_suffix .cdef)'
 complete -c cdef -n 'string match --quiet -- "-*" (commandline -ct)' -a '(__cdef_options)'

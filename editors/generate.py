@@ -36,6 +36,25 @@ def longest_first(names):
     return sorted(names, key=lambda name: (-len(name), name))
 
 
+# The shapes of lines, for Vim and, below, for grammars.
+# SKIPPED: empty, or a comment with nothing but blanks and quotes in front; in column 1 too. Behind an odd number of
+# quotes only the number sign begins one.
+# NAME: of an attribute, with the blanks at its end. WITHOUT_VALUE: what lacks the equals sign, up to a comment.
+# VALUED: an equals sign; but a line whose value is "" is not looked at, whatever its name.
+VIM_SKIPPED = r"""\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)"""
+VIM_HEADER = rf"{VIM_SKIPPED}\@![^ \t]"
+VIM_NAME = r"""\%(\/[\/*]\)\@![^= \t#"]\%(\%(\/[\/*]\)\@![^=#]\)*"""
+VIM_WITHOUT_VALUE = r"""\%(\/[\/*]\)\@![^= \t#"]\%(\%(\/[\/*]\)\@![^=#"]\)*\ze\%(#\|\/[\/*]\|$\)"""
+VIM_VALUED = r"""=\%(""[ \t]*\%(#\|\/[\/*]\|$\)\)\@!"""
+VIM_AFTER_HEADER = r"\%([ \t#]\|\/[\/*]\|$\)"
+
+SKIPPED = r"""(?:["\t ]*(?:#|$)|[\t ]*(?:"[\t ]*"[\t ]*)*/[/*])"""
+HEADER = rf"(?!{SKIPPED})[^ \t\r\n]"
+NAME = r"""(?!/[/*])[^= \t#"](?:(?!/[/*])[^=#])*"""
+WITHOUT_VALUE = r"""(?!/[/*])[^= \t\r\n#"](?:(?!/[/*])[^=#"\r\n])*(?=#|/[/*]|$)"""
+VALUED = r"""=(?!""[ \t]*(?:#|/[/*]|$))"""
+AFTER_HEADER = r"(?=[ \t#]|/[/*]|$)"
+
 VIM_HEAD = '''" Vim syntax file
 " Language: class definition source of cdgen
 " Made by editors/generate.py from the compiler's catalogue; do not edit.
@@ -45,9 +64,6 @@ if exists("b:current_syntax")
 endif
 
 syn case match
-syn match cdefUnknownStanza /^[^ \\t#\\/].*$/ contains=cdefComment
-syn match cdefUnknownAttribute /^[ \\t]\\+\\zs[^= \\t#"\\/][^=#]*\\ze=/ contained
-syn match cdefNoAttribute /^[ \\t]\\+\\zs[^= \\t#"\\/][^=]*$/ contained contains=cdefComment
 syn region cdefString start=/"/ end=/"\\|$/ contained oneline
 syn match cdefNumber /[=,]\\@1<=-\\?\\%(0[xX]\\x\\+\\|\\d\\+\\%(\\.\\d*\\)\\?\\%([eE][-+]\\?\\d\\+\\)\\?\\)\\ze\\%([,. \\t#]\\|$\\)/ contained
 syn match cdefComment /\\%(#\\|\\/\\/\\|\\/\\*\\).*$/ contains=@Spell
@@ -74,6 +90,9 @@ let b:current_syntax = "cdefsrc"
 def vim_syntax(stanzas, words):
     """Attributes are known inside their stanza only, so that a misspelt or misplaced one shows."""
     lines = [VIM_HEAD]
+    lines.append(f"syn match cdefUnknownStanza /^{VIM_HEADER}.*$/ contains=cdefComment")
+    lines.append(rf"syn match cdefUnknownAttribute /^[ \t]\+\zs{VIM_NAME}\ze{VIM_VALUED}/ contained")
+    lines.append(rf"syn match cdefNoAttribute /^[ \t]\+\zs{VIM_WITHOUT_VALUE}/ contained")
     types = r"\|".join(longest_first(words["type"] + words["variable"]))
     lines.append(rf"syn match cdefType /\%(DataType=\|VariableType=\)\@13<=\%({types}\)\ze\%([ \t#]\|$\)/ contained")
     properties = r"\|".join(longest_first(words["property"]))
@@ -84,8 +103,8 @@ def vim_syntax(stanzas, words):
         lines.append("")
         lines.append(rf"syn match cdefAttribute{stanza} /^[ \t]\+\zs\%({names}\)\ze=/ contained")
         lines.append(
-            f"syn region cdefIn{stanza} matchgroup=cdefStanza start=/^{stanza}\\ze\\%([ \\t#]\\|$\\)/ "
-            rf"end=/^\ze[^ \t#\/]/ "
+            rf"syn region cdefIn{stanza} matchgroup=cdefStanza start=/^{stanza}\ze{VIM_AFTER_HEADER}/ "
+            rf"end=/^\ze{VIM_HEADER}/ "
             f"contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttribute{stanza},{shared}"
         )
         lines.append(f"hi def link cdefAttribute{stanza} cdefAttribute")
@@ -97,15 +116,16 @@ def textmate_stanza(stanza, attributes):
     names = "|".join(longest_first(attributes))
     return {
         "name": f"meta.stanza.{stanza.lower()}.cdefsrc",
-        "begin": rf"^({stanza})(?=[ \t#]|$)",
+        "begin": rf"^({stanza}){AFTER_HEADER}",
         "beginCaptures": {"1": {"name": "keyword.control.stanza.cdefsrc"}},
-        "end": r"^(?=[^ \t#/\r\n])",
+        "end": rf"^(?={HEADER})",
         "patterns": [
             {"include": "#comment"},
             {"match": rf"^[ \t]+({names})(=)", "captures": {"1": {"name": "variable.other.attribute.cdefsrc"},
                                                              "2": {"name": "keyword.operator.assignment.cdefsrc"}}},
-            {"match": r"^[ \t]+([^= \t#\"/][^=#]*)(?==)",
+            {"match": rf"^[ \t]+({NAME})(?={VALUED})",
              "captures": {"1": {"name": "invalid.illegal.attribute.cdefsrc"}}},
+            {"match": rf"^[ \t]+({WITHOUT_VALUE})", "captures": {"1": {"name": "invalid.illegal.line.cdefsrc"}}},
             {"include": "#value"},
         ],
     }
@@ -122,7 +142,7 @@ def textmate_grammar(stanzas, words):
         "patterns": [
             {"include": "#comment"},
             *[{"include": f"#{stanza}"} for stanza in stanzas],
-            {"match": r"^[^ \t#/\r\n].*$", "name": "invalid.illegal.stanza.cdefsrc"},
+            {"match": rf"^{HEADER}.*$", "name": "invalid.illegal.stanza.cdefsrc"},
         ],
         "repository": {
             "comment": {"match": r"(#|//|/\*).*$", "name": "comment.line.cdefsrc"},

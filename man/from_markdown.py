@@ -6,7 +6,9 @@
 writes them to the directory, this one unless given; a test writes to another and compares.
 
 Knows the Markdown that the documents use: headings, paragraphs, tables, fenced code, links, code spans and lists.  A
-table of one column becomes a list, one of two a list of terms, a wider one a table if it fits the line.
+table of one column becomes a list, one of two a list of terms, a wider one a table if it fits the line.  The headings
+of a table are the first entry of its list: without them "may" and "may not" would look alike.  A whole class definition
+begins in the first column, so that a copy of what a terminal shows compiles.
 """
 
 import pathlib
@@ -19,7 +21,18 @@ MADE = [
     ("language.md", "cdefsrc", "source language of resource class definitions"),
     ("format.md", "cdb", "class definition database, byte by byte"),
 ]
-SEE_ALSO = "## See also\n\n`cdgen`(1), `cdef`(1), `cdefsrc`(5), `cdb`(5)"
+FILES = """## Files
+
+The documents, the examples and the headers are named as they stand in the project. Below the place where cdgen is \
+installed, such as `/usr`:
+
+| directory | has |
+|---|---|
+| `share/doc/cdgen/docs` | documents, such as `language.md` |
+| `share/doc/cdgen/examples` | examples, such as `FileSystem.cdefsrc` |
+| `include/cdgen` | headers, such as `cdb.h` |
+"""
+ALL_PAGES = (("cdgen", 1), ("cdef", 1), ("cdefsrc", 5), ("cdb", 5))
 DATE = "2026-11-21"  # of the release
 LINE = 72  # characters that a table may take
 PAGES = {document: f"`{name}`({SECTION})" for document, name, what in MADE}
@@ -61,22 +74,27 @@ def cells(line):
 
 
 def named(name, cell):
-    return f"\\fI{inline(name)}\\fR: {inline(cell)}"
+    return f"\\fI{inline(name)}\\fR: {inline(cell)}" if cell else ""
+
+
+def headings(first, last):
+    """As the first entry of a list."""
+    return [".TP", f"\\fI{inline(first)}\\fR", f"\\fI{inline(last)}\\fR"]
 
 
 def list_of_columns(head, rows):
     """A table that is too wide: below the first column the middle ones with their headings, then the last."""
-    out = []
+    out = headings(head[0], head[-1])
     for row in rows:
-        middle = "; ".join(named(name, cell) for name, cell in zip(head[1:-1], row[1:-1]) if cell)
+        middle = "; ".join(filter(None, map(named, head[1:-1], row[1:-1])))
         last = inline(row[-1]) if head[-1] in PLAIN_HEADINGS else named(head[-1], row[-1])
         out += [".TP", at_line_start(inline(row[0])) or "\\&", *([at_line_start(middle), ".br"] if middle else []),
                 *sentences(last or "\\&")]
     return out
 
 
-def list_of_terms(rows):
-    out = []
+def list_of_terms(head, rows):
+    out = headings(*head)
     for term, meaning in rows:
         out += [".TP", at_line_start(inline(term)) or "\\&", *sentences(inline(meaning) or "\\&")]
     return out
@@ -127,14 +145,21 @@ def table(lines):
     if len(head) == 1:
         return plain_list(rows)
     if len(head) == 2:
-        return list_of_terms(rows)
+        return list_of_terms(head, rows)
     return wide_table(head, rows)
 
 
 def code(lines):
     """Tabs stand for eight columns, as in a source."""
     body = [at_line_start(escape(line.expandtabs(8))) for line in lines]
+    if "ControlDefinition" in lines:
+        return [".PP", ".in 0", ".nf", *body, ".fi", ".in"]
     return [".PP", ".RS 4", ".nf", *body, ".fi", ".RE"]
+
+
+def see_also(name):
+    """The pages beside this one."""
+    return "## See also\n\n" + ", ".join(f"`{other}`({section})" for other, section in ALL_PAGES if other != name)
 
 
 def heading(line):
@@ -201,7 +226,8 @@ def main():
     for document, name, what in MADE:
         page = Page(name, what)
         page.add((HERE.parent / "docs" / document).read_text())
-        page.add(SEE_ALSO)
+        page.add(FILES)
+        page.add(see_also(name))
         text = "\n".join(page.out) + "\n"
         has_tables = ".TS\n" in text
         (target / f"{name}.{SECTION}").write_text(("'\\\" t\n" if has_tables else "") + text)

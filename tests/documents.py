@@ -32,6 +32,12 @@ def sources(path):
     return [block for block in blocks(path) if re.search(r"^ClassToManagerMapping$", block, re.M)]
 
 
+def broken_links(path):
+    """What a document's links name that is not there."""
+    targets = re.findall(r"\]\(([^)#]+)[^)]*\)", path.read_text())
+    return [target for target in targets if "://" not in target and not (path.parent / target).exists()]
+
+
 def chapters(path, depth):
     """Each heading of a depth with what is below it, up to the next of the same depth or a higher one."""
     parts = re.split(rf"^(#{{2,{depth}}}) (.*)\n", path.read_text(), flags=re.M)[1:]
@@ -48,4 +54,5 @@ def tables(text):
 
 
 def spans(text):
-    return re.findall(r"`([^`]+)`", text)
+    """Code spans; the marks of an example are none."""
+    return re.findall(r"(?<!`)`([^`\n]+)`(?!`)", text)

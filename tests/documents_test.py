@@ -4,6 +4,7 @@
     documents_test.py CDGEN LIST_NAMES
 """
 
+import datetime
 import pathlib
 import re
 import subprocess
@@ -11,7 +12,7 @@ import sys
 import tempfile
 import unittest
 
-from documents import DOCUMENTS, PAGES, PROJECT, sources
+from documents import DOCUMENTS, PAGES, PROJECT, broken_links, sources, tables, text_of
 
 CDGEN = LIST_NAMES = ""
 WITH_SOURCES = {"README.md", "language.md", "format.md", "cdgen.1", "cdefsrc.5", "cdb.5"}
@@ -56,17 +57,60 @@ class Sources(unittest.TestCase):
                 self.compile(path.read_text())
 
 
+class Tables(unittest.TestCase):
+    """What becomes of a document's tables on its page."""
+
+    def shown(self, cell):
+        """A cell as the page has it, without fonts."""
+        return re.escape(re.sub(r"\[([^\]]*)\]\([^)]*\)", r"\1", cell).replace("`", "").replace(r"\|", "|"))
+
+    def test_each_has_its_headings_on_the_page(self):
+        for document, page in (("language.md", "cdefsrc.5"), ("format.md", "cdb.5")):
+            text, at = text_of(PROJECT / "man" / page), 0
+            for head, *rows in tables((PROJECT / "docs" / document).read_text()):
+                if len(head) > 1:
+                    heads = [self.shown(cell) for cell in head]
+                    found = re.compile(rf"^(?:{heads[0]}\n{heads[-1]}|{chr(9).join(heads)})$", re.M).search(text, at)
+                    self.assertIsNotNone(found, f"{page}: {head}")
+                    at = found.end()
+
+    def test_no_cell_is_named_that_is_empty(self):
+        for page in PAGES:
+            self.assertNotRegex(page.read_text(), r"(?m)\\fI[^\n]*\\fR: *$", page.name)
+
+
 class Links(unittest.TestCase):
     def test_of_documents_lead_to_files(self):
         for path in DOCUMENTS:
-            for target in re.findall(r"\]\(([^)#]+)[^)]*\)", path.read_text()):
-                if "://" not in target:
-                    self.assertTrue((path.parent / target).exists(), f"{path.name}: {target}")
+            self.assertEqual(broken_links(path), [], path.name)
 
     def test_every_document_is_in_the_index(self):
         index = (PROJECT / "docs/README.md").read_text()
         for path in DOCUMENTS:
             self.assertIn(f"{path.name})", index, path.name)
+
+
+class Release(unittest.TestCase):
+    def found(self, name, expression):
+        """What the expression's group is in a file, which is there once."""
+        (value,) = re.findall(expression, (PROJECT / name).read_text(), re.M)
+        return value
+
+    def test_version_is_the_same_wherever_it_stands(self):
+        version = self.found("CMakeLists.txt", r"^project\(cdgen VERSION (\S+)")
+        self.assertEqual(self.found("editors/vscode/package.json", r'^  "version": "(.*)"'), version)
+        self.assertRegex((PROJECT / "CHANGELOG.md").read_text(), rf"(?m)^## {re.escape(version)},")
+
+    def test_nothing_else_asks_for_a_version(self):
+        for path in (*DOCUMENTS, *(PROJECT / "examples").rglob("CMakeLists.txt")):
+            self.assertNotRegex(path.read_text(), r"find_package\(cdgen \d", path)
+
+    def test_date_is_the_same_wherever_it_stands(self):
+        seconds = int(self.found("cmake/package.cmake", r"^set\(CPACK_CDGEN_RELEASED (\d+)\)"))
+        day = datetime.datetime.fromtimestamp(seconds, datetime.timezone.utc)
+        self.assertEqual(self.found("man/from_markdown.py", r'^DATE = "(.*?)"'), f"{day:%Y-%m-%d}")
+        for page in ("man/cdgen.1", "man/cdef.1"):
+            self.assertEqual(self.found(page, r"^\.Dd (.*)"), f"{day:%B} {day.day}, {day.year}")
 
 
 class Made(unittest.TestCase):

@@ -21,6 +21,9 @@ ENTRIES = {"vl_entry_t": "variety_list_t", "vv_entry_t": "valid_values_t", "sd_f
 # The members that hold the entries: the document has the entries themselves in their place.
 ARRAYS = {"vl_values", "vv_values", "sd_fields", "sbs_fields", "rc_hash_blocks"}
 UNION = {"u_ctxt": ["u_offset", "u_ctxt_name", "u_ctxt_pattr_id"]}  # likewise, of its members
+# What the names of fields begin with; what is called is a function.
+FIELD = r"\b(?:u_)?(?:rc|ra|ac|re|rd|rch|rcm|rm|rvc|vl|vv|sd|sbs|cda|cdb_hdr)_\w+(?!\w*\()"
+SUPPOSED = {"CONTRIBUTING.md": {"rc_owner_msgid", "RangeMessage"}}  # by examples of what is new
 SD_KINDS = "The nine SD definitions"
 
 
@@ -61,12 +64,12 @@ class Language(Names):
         return found
 
     def said_of(self, rows, earlier):
-        """attribute -> (required, repeats), as the rows say; 'as above' stands for another stanza's."""
+        """attribute -> (required, repeats, form), as the rows say; 'as above' stands for another stanza's."""
         head, said = rows[0], {}
         for row in rows[1:]:
             cell = dict(zip(head, row))
             for name in spans(cell["attribute"]):
-                words = [cell["required"], cell.get("repeats", "no")]
+                words = [cell["required"], cell.get("repeats", "no"), cell["form"].replace("`", "")]
                 if "as above" in words:
                     words = [above if word == "as above" else word for word, above in zip(words, earlier[name])]
                 said[name] = tuple(words)
@@ -77,8 +80,9 @@ class Language(Names):
         for kind, rows in self.stanza_chapters().items():
             earlier = said[kind] = self.said_of(rows, earlier)
         known = {stanza: {} for (stanza,) in self.names["stanza"]}
-        for stanza, name, needed, often in self.names["attribute"]:
-            known[stanza][name] = ("yes" if needed == "required" else "no", "yes" if often == "repeats" else "no")
+        for stanza, name, needed, often, *form in self.names["attribute"]:
+            known[stanza][name] = ("yes" if needed == "required" else "no", "yes" if often == "repeats" else "no",
+                                   " ".join(form))
         self.assertEqual(said, known)
 
     def test_list_of_stanzas_is_complete(self):
@@ -86,19 +90,22 @@ class Language(Names):
                   for name in spans(row[0])]
         self.assertEqual(sorted(listed), sorted(stanza for (stanza,) in self.names["stanza"]))
 
-    def words(self):
-        return tables(dict(chapters(LANGUAGE, 2))["Names"])
+    def words(self, first):
+        """The table of the chapter "Names" whose first heading that is, without its headings."""
+        (found,) = [rows for head, *rows in tables(dict(chapters(LANGUAGE, 2))["Names"]) if head[0] == first]
+        return found
 
     def test_properties(self):
-        of_class, of_others, _ = self.words()
-        said = {("class", name) for row in of_class[1:] for name in spans(" ".join(row))}
-        for row in of_others[1:]:
-            said |= {(row[0].split()[0], name) for name in spans(row[1])}
-        self.assertEqual(said, set(self.names["property"]))
+        said = []
+        for row in self.words("class property"):
+            said += [("class", *spans(name), bit) for name, bit in zip(row[::2], row[1::2]) if name]
+        for of, names in self.words("property of a"):
+            said += [(of.split()[0], *found) for found in re.findall(r"`(\w+)` (0x\w+)", names)]
+        self.assertEqual(sorted(said), sorted(self.names["property"]))
 
     def test_permissions(self):
-        letters = self.words()[2][0][1:]
-        self.assertEqual(letters, [letter for (letter,) in self.names["permission"]])
+        said = [(*spans(letter), mask) for letter, mask in self.words("permission letter")]
+        self.assertEqual(said, self.names["permission"])
 
     def test_data_types(self):
         said = [name for row in tables(dict(chapters(LANGUAGE, 2))["Data types"])[0][1:] for name in spans(row[0])]
@@ -148,6 +155,12 @@ class Pages(Names):
         for record, fields in known_fields(self.names).items():
             self.assertEqual(self.missing("cdb.5", fields), [], record)
 
+    def test_each_names_the_others(self):
+        for page in PAGES:
+            said = re.split(r"(?im)^\.SH \"?see also\"?$", text_of(page))[1]
+            others = {other.stem for other in PAGES} - {page.stem}
+            self.assertEqual(set(re.findall(r"\b(cdgen|cdef|cdefsrc|cdb)\b", said)), others, page)
+
     def test_whole_class_has_every_form_of_stanza(self):
         """Who knows nothing but the page finds a complete class in it."""
         most = max(sources(PROJECT / "man/cdefsrc.5"), key=len)
@@ -159,6 +172,20 @@ class Pages(Names):
 
 
 class Everywhere(Names):
+    def test_what_looks_like_a_field_is_one(self):
+        known = {name for record, field in self.names["field"] for name in (record, *field.split("."))}
+        known |= {name for names in UNION.values() for name in names}
+        for path in (*DOCUMENTS, *PAGES):
+            said = set(re.findall(FIELD, text_of(path)))
+            self.assertEqual(said - known - SUPPOSED.get(path.name, set()), set(), path)
+
+    def test_what_looks_like_a_name_of_the_language_is_one(self):
+        known = {row[row[0] in ("class", "persistent", "dynamic", "action") or kind == "attribute"]
+                 for kind in ("stanza", "attribute", "property", "type", "variable") for row in self.names[kind]}
+        for path in DOCUMENTS:
+            said = {span for span in spans(path.read_text()) if re.fullmatch(r"(?:[A-Z]+[a-z0-9]+){2,}[A-Z]*", span)}
+            self.assertEqual(said - known - SUPPOSED.get(path.name, set()), set(), path)
+
     def test_name_equals_value_is_an_attribute(self):
         attributes = {row[1] for row in self.names["attribute"]}
         for path in (*DOCUMENTS, *PAGES):

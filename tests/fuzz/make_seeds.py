@@ -59,8 +59,10 @@ def words(list_names):
             yield f"\n{rest[0]}\n"
         elif what == "attribute":
             yield f"\n\t{rest[1]}="
-        elif what in ("property", "type", "variable", "permission"):
-            yield rest[-1]
+        elif what == "property":
+            yield rest[1]
+        elif what in ("type", "variable", "permission"):
+            yield rest[0]
     yield from MORE_WORDS
 
 

@@ -2,12 +2,10 @@
 
 import os
 import shutil
-import time
 import unittest
 
-from installed import EXAMPLES, Case, only, run, tree
+from installed import Case, examples, later, only, pkg_config_environment, run, tree
 
-DISK = EXAMPLES / "projects/cmake/classes/Disk.cdefsrc"
 HEAD = """cmake_minimum_required(VERSION 3.25)
 project(trial LANGUAGES NONE)
 find_package(cdgen REQUIRED)
@@ -21,10 +19,8 @@ def found_in(root=None):
     return f"-Dcdgen_DIR={(root or tree()) / place.relative_to(tree())}"
 
 
-def later(path):
-    """Makes a file newer than whatever was built."""
-    soon = time.time() + 5
-    os.utime(path, (soon, soon))
+def disk():
+    return examples() / "projects/cmake/classes/Disk.cdefsrc"
 
 
 class Trial(Case):
@@ -50,35 +46,40 @@ class Compile:
     """What holds with every generator."""
 
     def test_class_without_name_is_called_after_the_bare_output(self):
-        self.project("cdgen_compile(disk a.cdefsrc deep/er/Disk.cdef)", a=DISK.read_bytes())
+        self.project("cdgen_compile(disk a.cdefsrc deep/er/Disk.cdef)", a=disk().read_bytes())
         self.build()
         self.assertIn(b"\0Disk\0", self.made("deep/er/Disk.cdef"))
         self.assertEqual(self.leftovers(), [])
 
     def test_changed_source_is_compiled_again(self):
-        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=DISK.read_bytes())
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=disk().read_bytes())
         self.build()
-        (self.here / "a.cdefsrc").write_bytes(DISK.read_bytes().replace(b"BlockSize", b"SectorLen"))
+        (self.here / "a.cdefsrc").write_bytes(disk().read_bytes().replace(b"BlockSize", b"SectorLen"))
         later(self.here / "a.cdefsrc")
         self.build()
         self.assertIn(b"SectorLen", self.made("a.cdef"))
 
     def test_nothing_changed_nothing_done(self):
-        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=DISK.read_bytes())
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=disk().read_bytes())
         self.build()
         before = (self.here / "b/a.cdef").stat()
         self.build()
         self.assertEqual((self.here / "b/a.cdef").stat().st_ino, before.st_ino)
 
-    def test_changed_compiler_compiles_again(self):
+    def project_with_a_tree_of_its_own(self):
+        """A project that uses a copy of the installed tree; returns the compiler in it."""
         copy = self.here / "tree"
-        shutil.copytree(tree(), copy)
-        (self.here / "a.cdefsrc").write_bytes(DISK.read_bytes())
+        shutil.copytree(tree(), copy, symlinks=True)
+        (self.here / "a.cdefsrc").write_bytes(disk().read_bytes())
         (self.here / "CMakeLists.txt").write_text(HEAD + "cdgen_compile(disk a.cdefsrc a.cdef)")
         run("cmake", "-G", self.GENERATOR, "-S", self.here, "-B", self.here / "b", found_in(copy))
+        return copy / "bin/cdgen"
+
+    def test_changed_compiler_compiles_again(self):
+        compiler = self.project_with_a_tree_of_its_own()
         self.build()
         before = (self.here / "b/a.cdef").stat()
-        later(copy / "bin/cdgen")
+        later(compiler)
         self.build()
         self.assertNotEqual((self.here / "b/a.cdef").stat().st_ino, before.st_ino)
 
@@ -90,8 +91,35 @@ class Compile:
         self.assertFalse((self.here / "b/a.cdef").exists())
         self.assertEqual(self.leftovers(), [])
 
+    def test_failure_shows_all_that_cdgen_says(self):
+        """Some of its messages have a part on standard output."""
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=b"ControlDefinition\n\tFileVersion=\n")
+        with self.assertRaises(AssertionError) as failed:
+            self.build()
+        self.assertRegex(str(failed.exception), r"In file .*a\.cdefsrc: *\n.*:2: error: Missing attribute value: ")
+
+    def test_what_a_killed_build_left_behind_is_cleared(self):
+        compiler = self.project_with_a_tree_of_its_own()
+        real = compiler.rename(compiler.with_name("real"))
+        compiler.write_text("#!/bin/sh\nfor to; do :; done\nprintf half >\"$to\"\nkill -9 $PPID\n")
+        compiler.chmod(0o755)
+        self.assertRaises(AssertionError, self.build)
+        (left,) = (self.here / "b").rglob(".cdgen-*")
+        self.assertEqual((left / "a.cdef").read_bytes(), b"half")
+        real.replace(compiler)
+        self.build()
+        self.assertEqual(self.leftovers(), [])
+        self.assertIn(b"BlockSize", self.made("a.cdef"))
+
+    def test_names_that_a_target_cannot_tell_apart(self):
+        names = ("a-b.cdef", "a_b.cdef", "a b.cdef", "a/b.cdef")
+        self.project("\n".join(f'cdgen_compile(all_db a.cdefsrc "{name}")' for name in names), a=disk().read_bytes())
+        self.build()
+        for name in names:
+            self.assertIn(b"BlockSize", self.made(name))
+
     def test_failure_is_tried_again(self):
-        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=DISK.read_bytes())
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=disk().read_bytes())
         self.build()
         (self.here / "a.cdefsrc").write_bytes(b"no such stanza\n")
         later(self.here / "a.cdefsrc")
@@ -100,7 +128,7 @@ class Compile:
 
     def test_no_output_without_the_map(self):
         """What cdgen refuses at the end of a source, it refuses before there is an output."""
-        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=DISK.read_bytes().split(b"ClassToManagerMapping")[0])
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=disk().read_bytes().split(b"ClassToManagerMapping")[0])
         with self.assertRaises(AssertionError) as failed:
             self.build()
         self.assertIn(f"{self.here}/a.cdefsrc: error: No class-to-manager maps defined", str(failed.exception))
@@ -108,14 +136,14 @@ class Compile:
 
     def test_byte_order_is_the_one_asked_for(self):
         self.project("cdgen_compile(both a.cdefsrc little.cdef BYTE_ORDER little)\n"
-                     "cdgen_compile(both a.cdefsrc big.cdef BYTE_ORDER big)", a=DISK.read_bytes())
+                     "cdgen_compile(both a.cdefsrc big.cdef BYTE_ORDER big)", a=disk().read_bytes())
         self.build()
         self.assertEqual((self.made("little.cdef")[8:12], self.made("big.cdef")[8:12]), (LITTLE, BIG))
 
     def test_time_of_building_is_left_out_on_request(self):
         self.project("cdgen_compile(with a.cdefsrc with.cdef BYTE_ORDER little)\n"
                      "cdgen_compile(without a.cdefsrc without.cdef BYTE_ORDER little NO_TIMESTAMP)",
-                     a=DISK.read_bytes())
+                     a=disk().read_bytes())
         environment = {name: value for name, value in os.environ.items() if name != "VX_CDB_FORCE_EMPTY_TIMESTAMP"}
         run("cmake", "--build", self.here / "b", env=environment)
         self.assertNotEqual(self.made("with.cdef")[16:20], bytes(4))
@@ -126,7 +154,7 @@ class Compile:
         sub.mkdir()
         names = [f"c{i}" for i in range(12)]
         for name in names:
-            (sub / f"{name}.cdefsrc").write_bytes(DISK.read_bytes().replace(b"BlockSize", name.encode()))
+            (sub / f"{name}.cdefsrc").write_bytes(disk().read_bytes().replace(b"BlockSize", name.encode()))
         (sub / "CMakeLists.txt").write_text(
             "\n".join(f"cdgen_compile(all_of_them {name}.cdefsrc {name}.cdef)" for name in names))
         self.project("add_subdirectory(classes)\n"
@@ -138,14 +166,14 @@ class Compile:
         self.assertEqual(self.made("taken.cdef"), self.made("classes/c11.cdef"))
 
     def test_absolute_paths_are_taken_as_they_are(self):
-        self.project(f'cdgen_compile(disk "{DISK}" "{self.here}/elsewhere/Disk.cdef")')
+        self.project(f'cdgen_compile(disk "{disk()}" "{self.here}/elsewhere/Disk.cdef")')
         self.build()
         self.assertTrue((self.here / "elsewhere/Disk.cdef").exists())
 
     def test_quarrels_with_what_it_does_not_know(self):
         for words in ("NO_TIME", "BYTE_ORDER middle", "BYTE_ORDER"):
             with self.subTest(words), self.assertRaises(AssertionError) as failed:
-                self.project(f"cdgen_compile(disk a.cdefsrc a.cdef {words})", a=DISK.read_bytes())
+                self.project(f"cdgen_compile(disk a.cdefsrc a.cdef {words})", a=disk().read_bytes())
             self.assertIn("cdgen_compile:", str(failed.exception))
 
 
@@ -159,7 +187,10 @@ class Make(Compile, Trial):
 
 class Package(Case):
     def test_wants_a_version_of_the_same_minor_number(self):
-        for version, found in (("0.1", True), ("0.1.0", True), ("0.2", False), ("1.0", False)):
+        here = run("pkg-config", "--modversion", "cdgen", env=pkg_config_environment()).strip()
+        major, minor, _ = map(int, here.split("."))
+        asked = ((f"{major}.{minor}", True), (here, True), (f"{major}.{minor + 1}", False), (f"{major + 1}.0", False))
+        for version, found in asked:
             (self.here / "CMakeLists.txt").write_text(HEAD.replace("cdgen REQUIRED", f"cdgen {version}") +
                                                       'message(STATUS "found: ${cdgen_FOUND}")')
             said = run("cmake", "-S", self.here, "-B", self.here / version, found_in())

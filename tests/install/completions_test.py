@@ -8,7 +8,7 @@ import time
 import unittest
 
 from installed import TIMEOUT, Case, only, program, run, tree
-from understood import options, options_of_cdgen, subcommands
+from understood import options, options_of_cdgen, subcommands, values
 
 
 class Shell(Case):
@@ -54,6 +54,13 @@ class Offers:
         for subcommand in subcommands():
             with self.subTest(subcommand):
                 self.assertEqual(self.offered(f"cdef {subcommand} -"), options(subcommand))
+
+    def test_values_of_options(self):
+        self.assertEqual(set(values("check")), {"--format", "--warn", "--no-warn"})
+        for subcommand in subcommands():
+            for option, known in values(subcommand).items():
+                with self.subTest(subcommand, option=option):
+                    self.assertEqual(self.offered(f"cdef {subcommand} {option} "), known)
 
     def test_databases_for_a_subcommand(self):
         offered = self.offered("cdef verify ")
@@ -138,9 +145,16 @@ class Zsh(Shell):
         self.assertEqual(self.completed("cdgen -s D"), ["-s", "Disk.cdefsrc"])
         self.assertEqual(self.completed("cdgen Disk.cdefsrc T"), ["Disk.cdefsrc", "Tape Drive.cdef"])
 
+    def test_values_of_options(self):
+        self.assertEqual(self.completed("cdef check --format j"), ["check", "--format", "json"])
+        for option, known in values("check").items():
+            with self.subTest(option):
+                self.completed(f"cdef check {option} ")
+                self.assertLessEqual(known, set(self.said.split()))
+
     def test_options_of_cdgen(self):
-        said = set(re.findall(r"^  '(-\w)", only("share/zsh/*/_cdgen").read_text(), re.M))
-        self.assertEqual(said, options_of_cdgen())
+        self.completed("cdgen -")
+        self.assertEqual(set(re.findall(r"^(-\w) +-- ", self.said.replace("\r", ""), re.M)), options_of_cdgen())
 
 
 if __name__ == "__main__":

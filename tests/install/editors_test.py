@@ -1,9 +1,11 @@
 """The files for editors, in the editors themselves as far as they run without a screen."""
 
 import json
+import re
+import subprocess
 import unittest
 
-from installed import EXAMPLES, Case, run, tree
+from installed import PROJECT, Case, examples, program, run, tree
 
 SOURCE = """ControlDefinition
 	FileVersion=1.0.0.0
@@ -21,14 +23,68 @@ PersistentResourceAttribute
 """
 
 
+# Every one of these lines compiles.
+RIGHT = """"" # a comment
+ControlDefinition// x
+	FileVersion=1.0.0.0
+	Wrong=""	// not looked at
+" " /* a comment
+ResourceClass/* y */
+	Description=1
+"" // a comment
+	DisplayName=2//x
+ 	/* a comment
+"
+	Properties=HasResources
+	ClassPermTemplate=0
+	ResourcePermTemplate=0
+	 "" # a comment
+	Name="a = b # c"
+ClassToManagerMapping # z
+	ResourceManager=Mgr1
+	FirstKey=1
+	LastKey=100
+	MessageCatalog=mgr1.cat
+	DescriptiveMessageSet=1
+"""
+# None of these does, put in front of the last stanza; each with the kind of mistake that it is.
+WRONG = [
+    ("/ResourceClass", "stanza"), ("ResourceClass/", "stanza"), ("ResourceClas", "stanza"),
+    ('"" ResourceClass', "stanza"), ('" // x', "stanza"), ("\tNam # a=b", "no value"),
+    ("\tNam // a=b", "no value"), ("\tName", "no value"), ("\tNam=1", "attribute"), ("\tName =1", "attribute"),
+    ("\t/Name=1", "attribute"), ("\tFirstKey=1", "attribute"), ('\tNam="" x', "attribute"),
+]
+
+
+def compiles(place, source):
+    (place / "tried.cdefsrc").write_bytes(source)
+    return subprocess.run([program("cdgen"), "tried.cdefsrc", "tried.cdef"], cwd=place, check=False,
+                          capture_output=True).returncode == 0
+
+
+def right_sources(place):
+    """Sources that compile: the examples, and the golden ones that do."""
+    golden = (PROJECT / "tests/golden").rglob("*.cdefsrc")
+    found = {path.stem: path.read_bytes() for path in (*golden, *examples().rglob("*.cdefsrc"))}
+    return {name: text.decode("latin-1") for name, text in found.items() if compiles(place, text)}
+
+
+def wrong_sources():
+    """Each with the mistake that is to be found in it: the line's number, and the kind."""
+    before, header, after = RIGHT.partition("ClassToManagerMapping")
+    at = before.count("\n") + 1
+    return [(f"{before}{line}\n{header}{after}", (at, kind)) for line, kind in WRONG]
+
+
 class Vim(Case):
     def ask(self, file, script):
         """What the script appends to the list 'said', with the file open."""
         (self.here / "ask.vim").write_text(script)
         out = self.here / "said"
         run("vim", "-u", "NONE", "-N", "-i", "NONE", "-es",
-            "--cmd", f"set runtimepath^={tree()}/share/cdgen/editors/vim", "-c", "filetype plugin on",
-            "-c", "syntax on", "-c", f"edit {file}", "-c", "let said = []", "-S", self.here / "ask.vim",
+            "--cmd", f"let &runtimepath = '{tree()}/share/cdgen/editors/vim,' . &runtimepath",
+            "-c", "filetype plugin on", "-c", "syntax on", "-c", f"edit {file}",
+            "-c", "let said = []", "-S", self.here / "ask.vim",
             "-c", f"call writefile(said, '{out}')", "-c", "qall!", cwd=self.here)
         return out.read_text().splitlines()
 
@@ -66,11 +122,44 @@ class Vim(Case):
             ["cdefAttributePersistentResourceAttribute", "cdefString"],
         ])
 
-    def test_shows_no_mistake_in_the_examples(self):
-        for example in sorted(EXAMPLES.glob("*.cdefsrc")):
-            groups = {name for line in self.groups(example.read_text()) for name in line}
-            self.assertIn("cdefStanza", groups)
-            self.assertFalse({"cdefUnknownStanza", "cdefUnknownAttribute", "cdefNoAttribute"} & groups, example.name)
+    MISTAKES = {"cdefUnknownStanza": "stanza", "cdefUnknownAttribute": "attribute", "cdefNoAttribute": "no value"}
+
+    def mistakes(self, sources):
+        """Of each source: the numbers of the lines that have one, and what it is. Mistakes are marked from the first
+        character on that is no blank."""
+        for i, source in enumerate(sources):
+            (self.here / f"{i}.cdefsrc").write_bytes(source.encode("latin-1"))
+        said = self.ask("0.cdefsrc", f"""
+            for i in range({len(sources)})
+              execute 'edit!' i . '.cdefsrc'
+              for line in range(1, line('$'))
+                let name = synIDattr(synID(line, match(getline(line), '[^ \t]') + 1, 1), 'name')
+                if has_key({self.MISTAKES}, name)
+                  call add(said, join([i, line, name]))
+                endif
+              endfor
+            endfor
+            """)
+        found = [[] for _ in sources]
+        for i, line, name in map(str.split, said):
+            found[int(i)].append((int(line), self.MISTAKES[name]))
+        return found
+
+    def test_shows_no_mistake_in_what_compiles(self):
+        sources = right_sources(self.here)
+        self.assertGreater(len(sources), 100)
+        for name, mistakes in zip(sources, self.mistakes(list(sources.values()))):
+            self.assertEqual(mistakes, [], name)
+
+    def test_shows_no_mistake_in_odd_lines_that_compile(self):
+        self.assertTrue(compiles(self.here, RIGHT.encode()))
+        self.assertEqual(self.mistakes([RIGHT]), [[]])
+
+    def test_shows_each_mistake(self):
+        sources = wrong_sources()
+        for (source, mistake), found in zip(sources, self.mistakes([source for source, _ in sources])):
+            self.assertFalse(compiles(self.here, source.encode()), source)
+            self.assertEqual(found, [mistake], source)
 
     def test_make_checks_the_file(self):
         (self.here / "a.cdefsrc").write_text(SOURCE)
@@ -89,8 +178,9 @@ class Vim(Case):
         self.assertEqual(said, ["a.cdefsrc|4|2|e|no such attribute [C101]", "a.cdefsrc|9|1|w|odd [C7]"])
 
 
-class TextMate(unittest.TestCase):
+class TextMate(Case):
     def setUp(self):
+        super().setUp()
         self.root = tree() / "share/cdgen/editors/vscode"
         self.grammar = json.loads((self.root / "syntaxes/cdefsrc.tmLanguage.json").read_text())
 
@@ -114,12 +204,49 @@ class TextMate(unittest.TestCase):
         for expression in found:
             self.matches(expression, "")
 
-    def test_known_attribute_is_one_of_its_stanza(self):
-        known, unknown = [rule["match"] for rule in self.grammar["repository"]["ResourceClass"]["patterns"]
-                          if "match" in rule]
-        for line, is_known in (("\tLocator=x", True), ("\tLocater=x", False), ("\tFirstKey=1", False)):
-            self.assertEqual(self.matches(known, line), is_known, line)
-            self.assertTrue(self.matches(unknown, line), line)  # which comes second
+    def begun(self, lines):
+        """What of the grammar begins where a line does: of each line, the expressions."""
+        used = sorted({text for text in self.expressions(self.grammar) if text.startswith("^")})
+        (self.here / "asked.json").write_text(json.dumps([used, lines]))
+        said = run("jq", "-c", ".[0] as $used | .[1] | map(. as $line | $used | map(. as $one | $line | test($one)))",
+                   self.here / "asked.json")
+        return [{text for text, matches in zip(used, found) if matches} for found in json.loads(said)]
+
+    def rule_at(self, patterns, begun):
+        """The first one that begins a line; included ones are looked up."""
+        for rule in patterns:
+            rule = self.grammar["repository"][rule["include"][1:]] if "include" in rule else rule
+            if rule.get("match", rule.get("begin")) in begun:
+                return rule
+        return None
+
+    def mistakes(self, source):
+        """The numbers of the lines that have one, and what it is; as an editor goes through them."""
+        found, stanza, lines = [], None, source.split("\n")
+        kinds = {"stanza": "stanza", "attribute": "attribute", "line": "no value"}
+        for number, begun in enumerate(self.begun(lines), 1):
+            if stanza and stanza["end"] in begun:
+                stanza = None
+            rule = self.rule_at((stanza or self.grammar)["patterns"], begun)
+            if rule and "begin" in rule:
+                stanza = rule
+            said = re.search(r"invalid\.illegal\.(\w+)", json.dumps(rule.get("captures", rule)) if rule else "")
+            if said and "begin" not in rule:
+                found.append((number, kinds[said.group(1)]))
+        return found
+
+    def test_shows_no_mistake_in_what_compiles(self):
+        sources = right_sources(self.here)
+        self.assertGreater(len(sources), 100)
+        for name, source in sources.items():
+            self.assertEqual(self.mistakes(source), [], name)
+
+    def test_shows_no_mistake_in_odd_lines_that_compile(self):
+        self.assertEqual(self.mistakes(RIGHT), [])
+
+    def test_shows_each_mistake(self):
+        for source, mistake in wrong_sources():
+            self.assertEqual(self.mistakes(source), [mistake], source)
 
     def test_every_rule_that_is_included_exists(self):
         included = [name for name in json.dumps(self.grammar).split('"') if name.startswith("#")]

@@ -5,12 +5,13 @@ import pathlib
 import shutil
 import subprocess
 import tempfile
+import time
 import unittest
 
 PROJECT = pathlib.Path(__file__).resolve().parents[2]
 BUILD = pathlib.Path(os.environ.get("CDGEN_BUILD", PROJECT / "build" / "package"))
-EXAMPLES = PROJECT / "examples"
 TIMEOUT = 600
+MOVED = "moved elsewhere"  # a blank in a path is what build systems stumble over
 
 _installed = None
 
@@ -31,8 +32,8 @@ def tree():
         _installed = tempfile.TemporaryDirectory(prefix="cdgen-install-")
         stage = pathlib.Path(_installed.name)
         run("cmake", "--install", BUILD, "--prefix", stage / "before")
-        (stage / "before").rename(stage / "moved")
-    return pathlib.Path(_installed.name) / "moved"
+        (stage / "before").rename(stage / MOVED)
+    return pathlib.Path(_installed.name) / MOVED
 
 
 def only(pattern):
@@ -43,6 +44,15 @@ def only(pattern):
     return found[0]
 
 
+def documents():
+    """Where the documents and the examples are."""
+    return tree() / "share/doc/cdgen"
+
+
+def examples():
+    return documents() / "examples"
+
+
 def program(name):
     return tree() / "bin" / name
 
@@ -50,6 +60,12 @@ def program(name):
 def pkg_config_environment():
     """Finds the tree's cdgen.pc, and no other."""
     return {**os.environ, "PKG_CONFIG_LIBDIR": str(only("lib*/**/cdgen.pc").parent)}
+
+
+def later(path):
+    """Makes a file newer than whatever was built."""
+    soon = time.time() + 5
+    os.utime(path, (soon, soon))
 
 
 class Case(unittest.TestCase):

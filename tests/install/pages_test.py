@@ -6,8 +6,8 @@ import re
 import subprocess
 import unittest
 
-from installed import run, tree
-from understood import options, options_of_cdgen, subcommands
+from installed import Case, program, run, tree
+from understood import options, options_of_cdgen, subcommands, values
 
 
 class Pages(unittest.TestCase):
@@ -33,6 +33,24 @@ class Pages(unittest.TestCase):
             self.assertIn(f"{name.upper()}({section})", shown)
 
 
+class Copied(Case):
+    """Who copies the class from the page, as a terminal shows it, has a source."""
+
+    def compile(self, shown):
+        chapter = re.search(r"^A WHOLE CLASS\n(.*?)^LINES$", shown, re.M | re.S).group(1)
+        (self.here / "Printer.cdefsrc").write_text(chapter[re.search(r"^#", chapter, re.M).start():])
+        run(program("cdgen"), "Printer.cdefsrc", "Printer.cdef", cwd=self.here)
+        self.assertIn("PrintTestPage", run(program("cdef"), "dump", "Printer.cdef", cwd=self.here))
+
+    def test_from_man(self):
+        page = tree() / "share/man/man5/cdefsrc.5"
+        self.compile(run("man", "--local-file", page, env={**os.environ, "MANWIDTH": "80"}))
+
+    def test_from_mandoc(self):
+        page = tree() / "share/man/man5/cdefsrc.5"
+        self.compile(re.sub(".\x08", "", run("mandoc", "-T", "ascii", page)))
+
+
 class Options(unittest.TestCase):
     """The handwritten pages have what the programs understand."""
 
@@ -51,6 +69,10 @@ class Options(unittest.TestCase):
         self.assertEqual(shared, options())
         for subcommand in subcommands():
             self.assertEqual(said[subcommand] | {"-h", "--help"}, options(subcommand), subcommand)
+
+    def test_names_of_warnings(self):
+        said = self.page("cdef").split("explains, are\n")[1].split(".It ")[0]
+        self.assertEqual(set(re.findall(r"^\.Cm (\S+)", said, re.M)) | {"all"}, values("check")["--warn"])
 
     def options_in(self, text):
         return {f"-{name}" for line in re.findall(r"^\.It Fl (.*)", text, re.M) for name in line.split(" , ")}

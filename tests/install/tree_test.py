@@ -1,14 +1,22 @@
 """What is installed, and where."""
 
+import ctypes
 import os
+import pathlib
+import re
+import shlex
+import sys
 import unittest
 
-from installed import BUILD, EXAMPLES, Case, only, pkg_config_environment, program, run, tree
+from installed import BUILD, PROJECT, Case, documents, examples, only, pkg_config_environment, program, run, tree
+
+sys.path.insert(0, str(PROJECT / "tests"))
+from documents import broken_links, text_of
 
 
 class Tree(Case):
     def test_programs_run(self):
-        run(program("cdgen"), EXAMPLES / "FileSystem.cdefsrc", self.here / "a.cdef")
+        run(program("cdgen"), examples() / "FileSystem.cdefsrc", self.here / "a.cdef")
         self.assertEqual(run(program("cdef"), "verify", self.here / "a.cdef"), "")
 
     def test_has_the_four_headers_and_no_other(self):
@@ -38,6 +46,67 @@ class Tree(Case):
         run("cmake", "--install", BUILD, "--prefix", "/some/prefix", env={**os.environ, "DESTDIR": str(self.here)})
         self.assertTrue((self.here / "some/prefix/bin/cdgen").is_file())
         self.assertEqual([path.name for path in self.here.iterdir()], ["some"])
+
+
+class Documents(unittest.TestCase):
+    def test_links_lead_to_files(self):
+        found = sorted(documents().rglob("*.md"))
+        self.assertIn("CONTRIBUTING.md", [path.name for path in found])
+        for path in found:
+            self.assertEqual(broken_links(path), [], path.name)
+
+    def test_files_that_pages_name_are_where_the_pages_say(self):
+        places = {"docs": "share/doc/cdgen/docs", "examples": "share/doc/cdgen/examples", "include": "include/cdgen"}
+        for page in sorted((tree() / "share/man").rglob("*.[15]")):
+            text = text_of(page)
+            for directory, name in re.findall(r"\b(?:(docs|examples|include)/)?(\w+\.(?:md|h|cdefsrc))\b", text):
+                suffix = name.rpartition(".")[2]
+                place = places[directory or {"md": "docs", "h": "include", "cdefsrc": "examples"}[suffix]]
+                if not directory and suffix == "cdefsrc" and not (tree() / place / name).exists():
+                    continue  # the reader's own source
+                self.assertTrue((tree() / place / name).is_file(), f"{page.name}: {name}")
+                self.assertIn(place, text, page.name)
+
+
+class WithoutTheInspector(Case):
+    def test_nothing_of_it_is_installed(self):
+        """Its libraries are missing where it is built."""
+        build, prefix = self.here / "b", self.here / "p"
+        missing = [f"-DCMAKE_DISABLE_FIND_PACKAGE_{library}=ON" for library in ("CLI11", "nlohmann_json")]
+        said = run("cmake", "--preset", "package", "-B", build, *missing, "-DCMAKE_CXX_FLAGS_RELEASE=-O0", cwd=PROJECT)
+        self.assertIn("cdef is left out", said)
+        run("cmake", "--build", build)
+        run("cmake", "--install", build, "--prefix", prefix)
+        ours = {path.relative_to(tree()) for path in tree().rglob("*") if path.stem.lstrip("_") == "cdef"}
+        self.assertEqual({path.parts[0] for path in ours}, {"bin", "share"})
+        ours.remove(pathlib.Path("share/cdgen/editors/vim/compiler/cdef.vim"))  # which only runs it
+        here = {path.relative_to(prefix) for path in prefix.rglob("*")}
+        self.assertEqual(ours & here, set())
+        (config,) = prefix.rglob("cdgen.pc")
+        self.assertNotIn("cdef", config.read_text())
+        self.assertTrue((prefix / "bin/cdgen").is_file())
+
+
+PLUGIN = r"""
+#include "cdb_view.h"
+extern "C" int is_sound(const char *name) {
+    std::error_code error;
+    std::vector<std::byte> file = cdb::read_file(name, error);
+    return !error && cdb::is_sound(cdb::verify(cdb::database(file)));
+}
+"""
+
+
+class Shared(Case):
+    def test_library_can_be_part_of_a_shared_one(self):
+        """A plug-in, say of an interpreter, is one."""
+        (self.here / "plugin.cpp").write_text(PLUGIN)
+        flags = shlex.split(run("pkg-config", "--cflags", "--libs", "cdgen", env=pkg_config_environment()))
+        run("c++", "-std=c++20", "-fPIC", "-shared", "-Wl,--no-undefined", "plugin.cpp", "-o", "plugin.so", *flags,
+            cwd=self.here)
+        run(program("cdgen"), examples() / "FileSystem.cdefsrc", self.here / "a.cdef")
+        plugin = ctypes.CDLL(str(self.here / "plugin.so"))
+        self.assertEqual([plugin.is_sound(os.fsencode(self.here / name)) for name in ("a.cdef", "plugin.cpp")], [1, 0])
 
 
 class PkgConfig(unittest.TestCase):

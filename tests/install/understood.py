@@ -1,14 +1,22 @@
 """What the programs understand, from themselves."""
 
+import os
 import re
+import string
+import subprocess
 
-from installed import PROJECT, program, run
+from installed import program, run
 
 
 def options_of_cdgen():
-    """From where the compiler has them."""
-    (letters,) = re.findall(r'getopt\(argc, argv, "([^"]*)"\)', (PROJECT / "src/cdgen.cpp").read_text())
-    return {f"-{letter}" for letter in letters if letter != ":"}
+    """Those that it does not call invalid; it has no help."""
+    found = set()
+    for letter in string.ascii_letters + string.digits:
+        said = subprocess.run([program("cdgen"), f"-{letter}"], stderr=subprocess.PIPE, text=True, check=False,
+                              env={**os.environ, "LC_ALL": "C"}).stderr
+        if f"invalid option -- '{letter}'" not in said:
+            found.add(f"-{letter}")
+    return found
 
 
 def help_of(*words):
@@ -17,6 +25,12 @@ def help_of(*words):
 
 def subcommands():
     return set(re.findall(r"^  ([a-z]\S*)", help_of().split("Subcommands:\n")[1], re.M))
+
+
+def values(*words):
+    """The words that an option can have, of each option that lists them in a help text."""
+    listed = re.findall(r"^  (-\S+) [A-Z]+:\{([^}]*)\}", help_of(*words), re.M)
+    return {option: set(found.split(",")) for option, found in listed}
 
 
 def options(*words):

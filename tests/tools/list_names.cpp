@@ -2,12 +2,14 @@
  * documents, completions and editor files against them. The first word says what the rest is:
  *
  *   stanza NAME
- *   attribute STANZA NAME required|optional once|repeats
- *   property class|persistent|dynamic|action NAME
- *   permission LETTER
+ *   attribute STANZA NAME required|optional once|repeats FORM
+ *   property class|persistent|dynamic|action NAME BIT
+ *   permission LETTER MASK
  *   type NAME
  *   variable NAME
  *   field RECORD NAME
+ *
+ * FORM is the form of the value, as the language's document calls it: words, or nothing where every value is refused.
  */
 
 #include "cdb_fields.h"
@@ -17,19 +19,64 @@
 
 namespace {
 
+struct form {
+    int type; /* attr_type */
+    const char *name;
+};
+
+constexpr form forms[] = {
+    {AT_UINT16, "number16"},
+    {AT_VALUE_DISPLAY, "number16"},
+    {AT_SD_DESCRIPTION, "number16"},
+    {AT_SD_DISPLAY, "number16"},
+    {AT_SD_VALUE_DISPLAY, "number16"},
+    {AT_ID, "number32"},
+    {AT_STRING, "text"},
+    {AT_MANAGER, "text"},
+    {AT_LOCATOR, "text"},
+    {AT_SD_NAME, "text"},
+    {AT_CLASS_PROPS, "names"},
+    {AT_PATTR_PROPS, "names"},
+    {AT_DATTR_PROPS, "names"},
+    {AT_ACTION_PROPS, "names"},
+    {AT_VERSION, "version"},
+    {AT_VARIETY, "low,high"},
+    {AT_RANGE, "two values with ,: low,high"},
+    {AT_DATA_TYPE, "type"},
+    {AT_SD_DATA_TYPE, "type"},
+    {AT_VARIABLE_TYPE, "Counter, Quantity, State or Quantum"},
+    {AT_DEFAULT_VALUE, "value"},
+    {AT_INITIAL_VALUE, "value"},
+    {AT_VALID_VALUE, "value(s)"},
+    {AT_SD_VALID_VALUE, "value(s)"},
+    {AT_SD_INDEX, "decimal number"},
+    {AT_PERMISSION, "a letter"},
+    {AT_PERM_TEMPLATE, "anything"},
+    {AT_LIST_ACTION_CLASS, "anything"},
+    {AT_LIST_ACTION_RSRC, "anything"},
+    {AT_SD_DEFAULT_VALUE, ""},
+};
+
+const char *form_of(int type) {
+    for (const form &f : forms)
+        if (f.type == type)
+            return f.name;
+    return "of no name";
+}
+
 void list_stanzas() {
     for (const srtable_ctrl &stanza : std::span(sc_tables).first(SC_COUNT))
         std::printf("stanza %s\n", stanza.sc_name);
     for (const srtable_ctrl &stanza : std::span(sc_tables).first(SC_COUNT))
         for (const table_attrs &attr : stanza.sc_attrs)
-            std::printf("attribute %s %s %s %s\n", stanza.sc_name, attr.ta_name,
+            std::printf("attribute %s %s %s %s %s\n", stanza.sc_name, attr.ta_name,
                         (attr.req_bit & OPTIONAL) != 0 ? "optional" : "required",
-                        attr.dup_allowed != 0 ? "repeats" : "once");
+                        attr.dup_allowed != 0 ? "repeats" : "once", form_of(attr.ta_type));
 }
 
 void list_properties(const char *of, std::span<const props_t> props) {
     for (const props_t &prop : props)
-        std::printf("property %s %s\n", of, prop.s);
+        std::printf("property %s %s 0x%x\n", of, prop.s, prop.p);
 }
 
 void list_words() {
@@ -38,7 +85,7 @@ void list_words() {
     list_properties("dynamic", da_props);
     list_properties("action", act_props);
     for (const valid_perms_t &perm : perm_list)
-        std::printf("permission %c\n", perm.permission);
+        std::printf("permission %c 0x%x\n", perm.permission, perm.mask);
     for (vx_data_type_t type : vxTypeMap)
         if (type != VX_UNKNOWN) /* which no source may name */
             std::printf("type %s\n", vxTypeStr[type]);

@@ -7,90 +7,90 @@ if exists("b:current_syntax")
 endif
 
 syn case match
-syn match cdefUnknownStanza /^[^ \t#\/].*$/ contains=cdefComment
-syn match cdefUnknownAttribute /^[ \t]\+\zs[^= \t#"\/][^=#]*\ze=/ contained
-syn match cdefNoAttribute /^[ \t]\+\zs[^= \t#"\/][^=]*$/ contained contains=cdefComment
 syn region cdefString start=/"/ end=/"\|$/ contained oneline
 syn match cdefNumber /[=,]\@1<=-\?\%(0[xX]\x\+\|\d\+\%(\.\d*\)\?\%([eE][-+]\?\d\+\)\?\)\ze\%([,. \t#]\|$\)/ contained
 syn match cdefComment /\%(#\|\/\/\|\/\*\).*$/ contains=@Spell
 
+syn match cdefUnknownStanza /^\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t].*$/ contains=cdefComment
+syn match cdefUnknownAttribute /^[ \t]\+\zs\%(\/[\/*]\)\@![^= \t#"]\%(\%(\/[\/*]\)\@![^=#]\)*\ze=\%(""[ \t]*\%(#\|\/[\/*]\|$\)\)\@!/ contained
+syn match cdefNoAttribute /^[ \t]\+\zs\%(\/[\/*]\)\@![^= \t#"]\%(\%(\/[\/*]\)\@![^=#"]\)*\ze\%(#\|\/[\/*]\|$\)/ contained
 syn match cdefType /\%(DataType=\|VariableType=\)\@13<=\%(Float32Array\|Float64Array\|BinaryArray\|StringArray\|UInt32Array\|UInt64Array\|Int32Array\|Int64Array\|Quantity\|Counter\|Float32\|Float64\|Quantum\|RHArray\|SDArray\|Binary\|String\|UInt32\|UInt64\|Int32\|Int64\|State\|None\|SBS\|RH\|SD\)\ze\%([ \t#]\|$\)/ contained
 syn match cdefProperty /\%(Properties=.*\)\@200<=\<\%(QryReqsMonitoring\|CanBatchUndefine\|CanBatchSetAttr\|CanBatchDefine\|HasConstraints\|InvalForDefine\|CanLiveUpdate\|ORBElectCoord\|ReqdForDefine\|HasResources\|OptForDefine\|SupportsMove\|HasIWAccess\|MtypCentral\|MtypDivided\|CanControl\|JoinPhase0\|JoinPhase1\|MtypGlobal\|CanDefine\|ReadOnly\|LongRun\|Public\|Select\)\>/ contained
 
 syn match cdefAttributeControlDefinition /^[ \t]\+\zs\%(FileVersion\)\ze=/ contained
-syn region cdefInControlDefinition matchgroup=cdefStanza start=/^ControlDefinition\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeControlDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInControlDefinition matchgroup=cdefStanza start=/^ControlDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeControlDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeControlDefinition cdefAttribute
 
 syn match cdefAttributeClassToManagerMapping /^[ \t]\+\zs\%(DescriptiveMessageSet\|ResourceManager\|MessageCatalog\|FirstKey\|LastKey\)\ze=/ contained
-syn region cdefInClassToManagerMapping matchgroup=cdefStanza start=/^ClassToManagerMapping\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeClassToManagerMapping,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInClassToManagerMapping matchgroup=cdefStanza start=/^ClassToManagerMapping\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeClassToManagerMapping,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeClassToManagerMapping cdefAttribute
 
 syn match cdefAttributeResourceVariableClass /^[ \t]\+\zs\%(ObservationInterval\|ReportingInterval\|VariableClass\|Alias\)\ze=/ contained
-syn region cdefInResourceVariableClass matchgroup=cdefStanza start=/^ResourceVariableClass\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeResourceVariableClass,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInResourceVariableClass matchgroup=cdefStanza start=/^ResourceVariableClass\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeResourceVariableClass,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeResourceVariableClass cdefAttribute
 
 syn match cdefAttributeResourceClass /^[ \t]\+\zs\%(ResourcePermTemplate\|ClassPermTemplate\|Description\|DisplayName\|Properties\|Locator\|Name\)\ze=/ contained
-syn region cdefInResourceClass matchgroup=cdefStanza start=/^ResourceClass\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeResourceClass,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInResourceClass matchgroup=cdefStanza start=/^ResourceClass\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeResourceClass,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeResourceClass cdefAttribute
 
 syn match cdefAttributePersistentResourceAttribute /^[ \t]\+\zs\%(ValueDisplayName\|ListActionClass\|ListActionRsrc\|DefaultValue\|VarietyRange\|Description\|DisplayName\|Properties\|ValidValue\|GroupName\|DataType\|GroupID\|Name\|Id\)\ze=/ contained
-syn region cdefInPersistentResourceAttribute matchgroup=cdefStanza start=/^PersistentResourceAttribute\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributePersistentResourceAttribute,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInPersistentResourceAttribute matchgroup=cdefStanza start=/^PersistentResourceAttribute\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributePersistentResourceAttribute,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributePersistentResourceAttribute cdefAttribute
 
 syn match cdefAttributePersistentClassAttribute /^[ \t]\+\zs\%(ValueDisplayName\|ListActionClass\|ListActionRsrc\|DefaultValue\|VarietyRange\|Description\|DisplayName\|Properties\|ValidValue\|GroupName\|DataType\|GroupID\|Name\|Id\)\ze=/ contained
-syn region cdefInPersistentClassAttribute matchgroup=cdefStanza start=/^PersistentClassAttribute\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributePersistentClassAttribute,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInPersistentClassAttribute matchgroup=cdefStanza start=/^PersistentClassAttribute\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributePersistentClassAttribute,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributePersistentClassAttribute cdefAttribute
 
 syn match cdefAttributeDynamicResourceAttribute /^[ \t]\+\zs\%(ExpressionDescription\|ReArmDescription\|ValueDisplayName\|ListActionClass\|ReArmExpression\|ValidStateValue\|ListActionRsrc\|VariableClass\|InitialValue\|VariableType\|VarietyRange\|Description\|DisplayName\|Expression\|Properties\|GroupName\|DataType\|GroupID\|Range\|Name\|Id\)\ze=/ contained
-syn region cdefInDynamicResourceAttribute matchgroup=cdefStanza start=/^DynamicResourceAttribute\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeDynamicResourceAttribute,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInDynamicResourceAttribute matchgroup=cdefStanza start=/^DynamicResourceAttribute\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeDynamicResourceAttribute,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeDynamicResourceAttribute cdefAttribute
 
 syn match cdefAttributeDynamicClassAttribute /^[ \t]\+\zs\%(ExpressionDescription\|ReArmDescription\|ValueDisplayName\|ListActionClass\|ReArmExpression\|ValidStateValue\|ListActionRsrc\|VariableClass\|InitialValue\|VariableType\|VarietyRange\|Description\|DisplayName\|Expression\|Properties\|GroupName\|DataType\|GroupID\|Range\|Name\|Id\)\ze=/ contained
-syn region cdefInDynamicClassAttribute matchgroup=cdefStanza start=/^DynamicClassAttribute\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeDynamicClassAttribute,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInDynamicClassAttribute matchgroup=cdefStanza start=/^DynamicClassAttribute\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeDynamicClassAttribute,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeDynamicClassAttribute cdefAttribute
 
 syn match cdefAttributeClassAction /^[ \t]\+\zs\%(ConfirmationMsg\|VarietyRange\|Description\|DisplayName\|Permission\|Properties\|TimeOut\|Name\|Id\)\ze=/ contained
-syn region cdefInClassAction matchgroup=cdefStanza start=/^ClassAction\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeClassAction,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInClassAction matchgroup=cdefStanza start=/^ClassAction\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeClassAction,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeClassAction cdefAttribute
 
 syn match cdefAttributeResourceAction /^[ \t]\+\zs\%(ConfirmationMsg\|VarietyRange\|Description\|DisplayName\|Permission\|Properties\|TimeOut\|Name\|Id\)\ze=/ contained
-syn region cdefInResourceAction matchgroup=cdefStanza start=/^ResourceAction\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeResourceAction,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInResourceAction matchgroup=cdefStanza start=/^ResourceAction\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeResourceAction,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeResourceAction cdefAttribute
 
 syn match cdefAttributePAttrSDDefinition /^[ \t]\+\zs\%(ValueDisplayName\|DefaultValue\|ElementIndex\|Description\|DisplayName\|ElementName\|ValidValue\|DataType\)\ze=/ contained
-syn region cdefInPAttrSDDefinition matchgroup=cdefStanza start=/^PAttrSDDefinition\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributePAttrSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInPAttrSDDefinition matchgroup=cdefStanza start=/^PAttrSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributePAttrSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributePAttrSDDefinition cdefAttribute
 
 syn match cdefAttributeDAttrSDDefinition /^[ \t]\+\zs\%(ValueDisplayName\|DefaultValue\|ElementIndex\|Description\|DisplayName\|ElementName\|ValidValue\|DataType\)\ze=/ contained
-syn region cdefInDAttrSDDefinition matchgroup=cdefStanza start=/^DAttrSDDefinition\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeDAttrSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInDAttrSDDefinition matchgroup=cdefStanza start=/^DAttrSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeDAttrSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeDAttrSDDefinition cdefAttribute
 
 syn match cdefAttributeDefineSDDefinition /^[ \t]\+\zs\%(ValueDisplayName\|DefaultValue\|ElementIndex\|Description\|DisplayName\|ElementName\|ValidValue\|DataType\)\ze=/ contained
-syn region cdefInDefineSDDefinition matchgroup=cdefStanza start=/^DefineSDDefinition\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeDefineSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInDefineSDDefinition matchgroup=cdefStanza start=/^DefineSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeDefineSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeDefineSDDefinition cdefAttribute
 
 syn match cdefAttributeUndefineSDDefinition /^[ \t]\+\zs\%(ValueDisplayName\|DefaultValue\|ElementIndex\|Description\|DisplayName\|ElementName\|ValidValue\|DataType\)\ze=/ contained
-syn region cdefInUndefineSDDefinition matchgroup=cdefStanza start=/^UndefineSDDefinition\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeUndefineSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInUndefineSDDefinition matchgroup=cdefStanza start=/^UndefineSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeUndefineSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeUndefineSDDefinition cdefAttribute
 
 syn match cdefAttributeOnlineSDDefinition /^[ \t]\+\zs\%(ValueDisplayName\|DefaultValue\|ElementIndex\|Description\|DisplayName\|ElementName\|ValidValue\|DataType\)\ze=/ contained
-syn region cdefInOnlineSDDefinition matchgroup=cdefStanza start=/^OnlineSDDefinition\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeOnlineSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInOnlineSDDefinition matchgroup=cdefStanza start=/^OnlineSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeOnlineSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeOnlineSDDefinition cdefAttribute
 
 syn match cdefAttributeOfflineSDDefinition /^[ \t]\+\zs\%(ValueDisplayName\|DefaultValue\|ElementIndex\|Description\|DisplayName\|ElementName\|ValidValue\|DataType\)\ze=/ contained
-syn region cdefInOfflineSDDefinition matchgroup=cdefStanza start=/^OfflineSDDefinition\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeOfflineSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInOfflineSDDefinition matchgroup=cdefStanza start=/^OfflineSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeOfflineSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeOfflineSDDefinition cdefAttribute
 
 syn match cdefAttributeResetSDDefinition /^[ \t]\+\zs\%(ValueDisplayName\|DefaultValue\|ElementIndex\|Description\|DisplayName\|ElementName\|ValidValue\|DataType\)\ze=/ contained
-syn region cdefInResetSDDefinition matchgroup=cdefStanza start=/^ResetSDDefinition\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeResetSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInResetSDDefinition matchgroup=cdefStanza start=/^ResetSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeResetSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeResetSDDefinition cdefAttribute
 
 syn match cdefAttributeActionInSDDefinition /^[ \t]\+\zs\%(ValueDisplayName\|DefaultValue\|ElementIndex\|Description\|DisplayName\|ElementName\|ValidValue\|DataType\)\ze=/ contained
-syn region cdefInActionInSDDefinition matchgroup=cdefStanza start=/^ActionInSDDefinition\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeActionInSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInActionInSDDefinition matchgroup=cdefStanza start=/^ActionInSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeActionInSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeActionInSDDefinition cdefAttribute
 
 syn match cdefAttributeActionOutSDDefinition /^[ \t]\+\zs\%(ValueDisplayName\|DefaultValue\|ElementIndex\|Description\|DisplayName\|ElementName\|ValidValue\|DataType\)\ze=/ contained
-syn region cdefInActionOutSDDefinition matchgroup=cdefStanza start=/^ActionOutSDDefinition\ze\%([ \t#]\|$\)/ end=/^\ze[^ \t#\/]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeActionOutSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
+syn region cdefInActionOutSDDefinition matchgroup=cdefStanza start=/^ActionOutSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeActionOutSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeActionOutSDDefinition cdefAttribute
 
 hi def link cdefUnknownStanza Error

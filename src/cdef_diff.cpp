@@ -71,7 +71,7 @@ json json_of(const difference &d) {
 
 thing read(const std::string &path, std::unique_ptr<input> &in) {
     in = std::make_unique<input>(path);
-    require_readable(*in);
+    require_readable_aloud(*in);
     try {
         return meaning_of(in->db);
     } catch (const trouble &t) {

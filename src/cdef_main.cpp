@@ -4,6 +4,7 @@
 
 #include <CLI/CLI.hpp>
 
+#include <array>
 #include <cerrno>
 #include <cstdarg>
 #include <cstdio>
@@ -16,10 +17,12 @@ namespace cdef {
 
 namespace {
 
-/* What may be wrong with a database that is looked into all the same. */
+/* Errors that a database may have and is looked into all the same. */
+constexpr std::array tolerated = {cdb::CODE_CHECKSUM, cdb::CODE_RESERVED};
+
 bool tolerable(const cdb::finding &finding) {
-    return finding.broken->level == cdb::severity::warning || finding.broken->code == cdb::CODE_CHECKSUM ||
-           finding.broken->code == cdb::CODE_RESERVED;
+    return finding.broken->level == cdb::severity::warning ||
+           std::find(tolerated.begin(), tolerated.end(), finding.broken->code) != tolerated.end();
 }
 
 std::vector<std::byte> contents_of(const std::string &path) {
@@ -34,10 +37,21 @@ std::vector<std::byte> contents_of(const std::string &path) {
 
 input::input(const std::string &path) : name(path), contents(contents_of(path)), db(contents) {}
 
-void require_readable(const input &in) {
+std::vector<cdb::finding> require_readable(const input &in) {
     std::vector<cdb::finding> findings = cdb::verify(in.db);
     if (!std::all_of(findings.begin(), findings.end(), tolerable))
         throw trouble(in.name + ": not a sound database; 'cdef verify' says why");
+    return findings;
+}
+
+void require_readable_aloud(const input &in) {
+    std::vector<cdb::finding> findings = require_readable(in);
+    for (std::string_view code : tolerated) {
+        auto found = std::find_if(findings.begin(), findings.end(),
+                                  [code](const cdb::finding &f) { return f.broken->code == code; });
+        if (found != findings.end())
+            std::fprintf(stderr, "cdef: %s: %s\n", in.name.c_str(), std::string(found->broken->title).c_str());
+    }
 }
 
 void appendf(std::string &to, const char *format, ...) {

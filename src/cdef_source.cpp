@@ -199,7 +199,7 @@ bool is_harmless(char c) {
 
 int source(const std::string &path) {
     input in(path);
-    require_readable(in);
+    require_readable_aloud(in);
     std::string text;
     try {
         text = source_of(in.db);

@@ -79,18 +79,63 @@ bool wants_colour() {
 
 namespace {
 
+constexpr std::string_view SHIELD = "./";
+
+/* The library would take an argument [a,b] for two, a and b, and [a] for a. As ./[a,b] it passes; that is the same
+ * file, and the option takes the beginning off again. */
+bool is_in_brackets(std::string_view argument) {
+    return argument.starts_with('[') && argument.ends_with(']');
+}
+
+std::vector<std::string> shielded(int argc, char **argv) {
+    std::vector<std::string> arguments(argv + std::min(1, argc), argv + argc);
+    for (std::string &argument : arguments)
+        if (is_in_brackets(argument))
+            argument.insert(0, SHIELD);
+    std::reverse(arguments.begin(), arguments.end()); /* the library wants the last one first */
+    return arguments;
+}
+
+std::string unshielded(std::string argument) {
+    bool has_shield = argument.starts_with(SHIELD);
+    return has_shield && is_in_brackets(std::string_view(argument).substr(SHIELD.size()))
+               ? argument.substr(SHIELD.size())
+               : argument;
+}
+
+void unshield_arguments(CLI::App &app) {
+    for (CLI::App *command : app.get_subcommands([](CLI::App *) { return true; }))
+        for (CLI::Option *option : command->get_options([](CLI::Option *o) { return o->get_items_expected_max() > 0; }))
+            option->transform(unshielded);
+}
+
+/* What is not understood comes before what is missing, which is often missed only because of it. Behind "--" there are
+ * no options. */
+std::string complaint(const CLI::App &app, const CLI::Error &usage) {
+    auto code = static_cast<CLI::ExitCodes>(usage.get_exit_code());
+    std::vector<std::string> unknown = app.remaining(true);
+    auto first = std::find_if(unknown.begin(), unknown.end(), [](const std::string &s) { return s != "--"; });
+    if (first == unknown.end() || (code != CLI::ExitCodes::RequiredError && code != CLI::ExitCodes::ExtrasError))
+        return usage.what();
+    std::string argument = unshielded(*first);
+    if (first == unknown.begin() && argument.size() > 1 && argument.front() == '-')
+        return argument + ": unknown option";
+    return argument + (app.get_subcommands().empty() ? ": unknown subcommand" : ": one operand too many");
+}
+
 int run(int argc, char **argv) {
     CLI::App app("Shows, checks and compares class definition databases.", "cdef");
     app.set_version_flag("--version", "cdef " CDGEN_VERSION);
     app.require_subcommand(1);
-    app.failure_message([](const CLI::App *, const CLI::Error &usage) {
-        return std::string("cdef: ") + usage.what() + "\nRun 'cdef --help' for more.\n";
+    app.failure_message([](const CLI::App *program, const CLI::Error &usage) {
+        return "cdef: " + complaint(*program, usage) + "\nRun 'cdef --help' for more.\n";
     });
     int status = OK;
     for (auto add : {add_verify, add_dump, add_diff, add_source, add_check})
         add(app, status);
+    unshield_arguments(app);
     try {
-        app.parse(argc, argv);
+        app.parse(shielded(argc, argv));
     } catch (const CLI::Success &help) {
         app.exit(help);
         std::cout.flush();

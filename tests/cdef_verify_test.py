@@ -207,6 +207,46 @@ class Input(unittest.TestCase):
             )
             self.assertEqual((result.returncode, result.stdout.decode()), (1, WRONG_LINE.format("-x.cdef")))
 
+    def test_names_in_brackets(self):
+        names = ["[x]", "[x,y]", "[]", "[[x]]"]
+        with tempfile.TemporaryDirectory() as directory:
+            for name in names:
+                (pathlib.Path(directory) / name).write_bytes((OPTIONS.images / WRONG).read_bytes())
+            result = subprocess.run(
+                [OPTIONS.cdef, "verify", *names], cwd=directory, capture_output=True, text=True, check=False, timeout=60
+            )
+        expected = "".join(WRONG_LINE.format(name) for name in names)
+        self.assertEqual((result.returncode, result.stdout, result.stderr), (1, expected, ""))
+
+
+class Usage(unittest.TestCase):
+    """What is said of a wrong command line: what is not understood before what is missing."""
+
+    MESSAGES = {
+        ("dmp", "FILE"): "dmp: unknown subcommand",
+        ("dmp", "--json", "-"): "dmp: unknown subcommand",
+        ("[dump]",): "[dump]: unknown subcommand",
+        ("--nothing", "dump", "FILE"): "--nothing: unknown option",
+        ("dump", "-x"): "-x: unknown option",
+        ("dump", "--", "-x", "-y"): "-y: one operand too many",
+        ("verify", "--jsn"): "--jsn: unknown option",
+        ("check", "--jsn"): "--jsn: unknown option",
+        ("source", "A", "B", "C"): "B: one operand too many",
+        ("diff", "A", "[B]", "[C]"): "[C]: one operand too many",
+        (): "A subcommand is required",
+        ("dump",): "FILE is required",
+    }
+
+    def test_messages(self):
+        for arguments, message in self.MESSAGES.items():
+            with self.subTest(arguments):
+                result = subprocess.run(
+                    [OPTIONS.cdef, *arguments], stdin=subprocess.DEVNULL, capture_output=True, text=True, check=False,
+                    timeout=60,
+                )
+                expected = (2, "", f"cdef: {message}\nRun 'cdef --help' for more.\n")
+                self.assertEqual((result.returncode, result.stdout, result.stderr), expected)
+
 
 @unittest.skipUnless(pathlib.Path("/dev/full").exists(), "a device that is always full is needed")
 class FullDevice(unittest.TestCase):

@@ -94,7 +94,7 @@ int verify(const verify_options &options) {
 void add_verify(CLI::App &app, int &status) {
     auto options = std::make_shared<verify_options>();
     CLI::App *command =
-        app.add_subcommand("verify", "Checks whether databases are sound; says nothing of those that are");
+        app.add_subcommand("verify", "Checks whether databases are sound; says nothing of those without findings");
     command->add_option("FILE", options->files, "Databases; - is standard input")->required();
     command->add_flag("--json", options->as_json, "Findings as JSON");
     command->add_flag("--werror", options->warnings_count, "Warnings count as errors");

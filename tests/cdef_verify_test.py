@@ -13,6 +13,7 @@ import sys
 import tempfile
 import unittest
 
+import documents
 import golden
 
 OPTIONS = argparse.Namespace()
@@ -137,6 +138,13 @@ class Json(unittest.TestCase):
     def test_keys_in_their_order(self):
         self.assertEqual(list(self.parsed(1, WRONG)[0]), ["file", "sound", "findings"])
         self.assertEqual(list(self.parsed(1, WRONG)[0]["findings"][0]), list(WRONG_FINDING))
+
+    def test_document_names_the_keys(self):
+        """In their order; a row may name several."""
+        chapter = dict(documents.chapters(HERE.parent / "docs" / "reader.md", 2))["cdef verify"]
+        of_file, of_finding = documents.tables(chapter)[-2:]
+        for table, expected in ((of_file, self.parsed(0, SOUND)[0]), (of_finding, WRONG_FINDING)):
+            self.assertEqual([key for row in table[1:] for key in documents.spans(row[0])], list(expected))
 
     def test_of_the_file_as_a_whole(self):
         self.assertIsNone(self.parsed(1, OF_THE_FILE)[0]["findings"][0]["section"])
@@ -327,14 +335,27 @@ STRAY_RANGES = {
 }
 
 
+def expected_warnings():
+    """The codes of the warnings that each careless golden source is known for, by case."""
+    lines = (HERE / "cdef" / "verify" / "golden-warnings.txt").read_text().splitlines()
+    cases = [line.split(": ") for line in lines if line and not line.startswith("#")]
+    return {name: codes.split() for name, codes in cases}
+
+
 class Compiled(unittest.TestCase):
-    """What the compiler makes has no errors."""
+    """What the compiler makes has no errors, and only careless sources have warnings."""
 
     def expect_sound(self, database, what):
         self.assertEqual(verify("-q", database), (0, "", ""), what)
 
+    def codes_of(self, database):
+        status, text, messages = verify("--json", database)
+        self.assertEqual((status, messages), (0, ""), text)
+        return [finding["code"] for finding in json.loads(text)[0]["findings"]]
+
     def test_golden_sources_in_both_orders(self):
-        count = 0
+        expected = expected_warnings()
+        sound = set()
         with tempfile.TemporaryDirectory() as directory:
             database = pathlib.Path(directory) / "made.cdef"
             for path in golden.cases_of([HERE / "golden"]):
@@ -342,9 +363,11 @@ class Compiled(unittest.TestCase):
                 for extra in ([], ["-s"]) if case.status == 0 else ():
                     _, _, after = golden.run(case, OPTIONS.cdgen, extra)
                     database.write_bytes(after[case.out])
-                    self.expect_sound(database, f"{case.name} {extra}")
-                    count += 1
-        self.assertGreater(count, 200)
+                    name = path.with_suffix("").relative_to(HERE / "golden").as_posix()
+                    self.assertEqual(self.codes_of(database), expected.get(name, []), f"{name} {extra}")
+                    sound.add(name)
+        self.assertGreater(len(sound), 100)
+        self.assertLessEqual(set(expected), sound, "cases that are no more")
 
     def compile(self, source, directory, extra):
         path = pathlib.Path(directory) / "made.cdefsrc"

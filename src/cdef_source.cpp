@@ -5,6 +5,7 @@
 #include "cdb_names.h"
 #include "cdef.h"
 #include "cdef_diff.h"
+#include "cdef_dump.h"
 
 #include <CLI/CLI.hpp>
 
@@ -193,8 +194,15 @@ std::string source_of(const cdb::database &db) {
 }
 
 /* Texts stand in a source as they are; a terminal must not be made to act on them. */
-bool is_harmless(char c) {
-    return (c >= ' ' && c <= '~') || c == '\n' || c == '\t';
+bool is_harmless(std::string_view text) {
+    while (!text.empty()) {
+        bool is_blank = text.front() == '\n' || text.front() == '\t';
+        std::size_t length = is_blank ? 1 : dump::printable_length(text);
+        if (length == 0)
+            return false;
+        text.remove_prefix(length);
+    }
+    return true;
 }
 
 int source(const std::string &path) {
@@ -206,7 +214,7 @@ int source(const std::string &path) {
     } catch (const trouble &t) {
         throw trouble(path + ": " + t.what());
     }
-    if (isatty(STDOUT_FILENO) != 0 && !std::all_of(text.begin(), text.end(), is_harmless))
+    if (isatty(STDOUT_FILENO) != 0 && !is_harmless(text))
         throw trouble(path + ": the source has characters that are not for terminals: write it to a file");
     print(text);
     return OK;

@@ -13,6 +13,7 @@ generated sources, in both byte orders.
 import argparse
 import os
 import pathlib
+import pty
 import subprocess
 import sys
 import tempfile
@@ -150,7 +151,42 @@ def check_tolerated(programs):
     return [] if actual == (0, expected, message) and expected else [f"{actual}"]
 
 
+def on_terminal(programs, directory):
+    """Status, what is seen and the message of the source of the database in a directory, written to a terminal."""
+    master, slave = pty.openpty()
+    with os.fdopen(master, "rb", buffering=0) as screen:
+        command = [programs.cdef, "source", DATABASE]
+        with subprocess.Popen(command, cwd=directory, stdout=slave, stderr=subprocess.PIPE) as process:
+            os.close(slave)
+            shown = b""
+            try:
+                while part := screen.read(65536):
+                    shown += part
+            except OSError:  # how a terminal ends
+                pass
+            return process.wait(TIMEOUT), shown.replace(b"\r\n", b"\n"), process.stderr.read()
+
+
+def check_terminal(programs):
+    """A terminal gets a source if there is nothing in it that the terminal would act on or hide."""
+    text = (CASES / "canonical.cdefsrc").read_bytes()
+    refusal = f"cdef: {DATABASE}: the source has characters that are not for terminals: write it to a file\n".encode()
+    names = {"plain": True, "é €\U0001f600": True, "e\u0301": True, "\x1b[1m": False, "\u202e": False, "\ufe0f": False, b"\xe9": False}
+    problems = []
+    for name, allowed in names.items():
+        name = name if isinstance(name, bytes) else name.encode()
+        with tempfile.TemporaryDirectory() as place:
+            directory = pathlib.Path(place)
+            database, message = programs.compile(directory, text.replace(b"mgr1.cat", name), "out.cdef", swap=False)
+            written = programs.source(directory, database).stdout
+            expected = (0, written, b"") if allowed else (TROUBLE, b"", refusal)
+            if name not in written or on_terminal(programs, directory) != expected:
+                problems.append(f"{name}: {message}{on_terminal(programs, directory)}")
+    return problems
+
+
 PROPERTIES = {
+    "on-a-terminal": check_terminal,
     "what-is-tolerated-is-told": check_tolerated,
     "all-golden-sources": lambda programs: check_sources(programs, golden_sources()),
     "all-other-sources": lambda programs: check_sources(programs, plain_sources()),

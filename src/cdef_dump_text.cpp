@@ -181,12 +181,12 @@ std::size_t printable_length(std::string_view bytes) {
     return length != 0 && is_printable(decode(bytes.substr(0, length))) ? length : 0;
 }
 
-std::string quoted(std::string_view bytes) {
-    std::string shown = "\"";
+/* slashed: characters that get a backslash. */
+static std::string escaped(std::string_view bytes, std::string_view slashed) {
+    std::string shown;
     while (!bytes.empty()) {
-        std::size_t length = utf8_length(bytes);
-        std::string_view character = bytes.substr(0, std::max<std::size_t>(length, 1));
-        if (character == "\"" || character == "\\")
+        std::string_view character = bytes.substr(0, std::max<std::size_t>(utf8_length(bytes), 1));
+        if (slashed.find(character) != std::string_view::npos)
             shown += '\\';
         if (printable_length(bytes) != 0)
             shown += character;
@@ -194,7 +194,15 @@ std::string quoted(std::string_view bytes) {
             append_escaped(shown, character);
         bytes.remove_prefix(character.size());
     }
-    return shown + "\"";
+    return shown;
+}
+
+std::string quoted(std::string_view bytes) {
+    return '"' + escaped(bytes, "\"\\") + '"';
+}
+
+std::string harmless(std::string_view bytes) {
+    return escaped(bytes, {});
 }
 
 std::string hex_of(std::span<const std::byte> bytes) {

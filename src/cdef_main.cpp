@@ -1,6 +1,7 @@
 /* cdef_main.cpp: cdef, which shows what is in a class definition database. */
 
 #include "cdef.h"
+#include "cdef_dump.h"
 
 #include <CLI/CLI.hpp>
 
@@ -35,6 +36,11 @@ std::vector<std::byte> contents_of(const std::string &path) {
 
 } // namespace
 
+/* Names of files are part of messages, and a name may hold anything. */
+static void complain(const std::string &text) {
+    std::fprintf(stderr, "cdef: %s\n", dump::harmless(text).c_str());
+}
+
 input::input(const std::string &path) : name(path), contents(contents_of(path)), db(contents) {}
 
 std::vector<cdb::finding> require_readable(const input &in) {
@@ -50,7 +56,7 @@ void require_readable_aloud(const input &in) {
         auto found = std::find_if(findings.begin(), findings.end(),
                                   [code](const cdb::finding &f) { return f.broken->code == code; });
         if (found != findings.end())
-            std::fprintf(stderr, "cdef: %s: %s\n", in.name.c_str(), std::string(found->broken->title).c_str());
+            complain(in.name + ": " + std::string(found->broken->title));
     }
 }
 
@@ -128,7 +134,7 @@ int run(int argc, char **argv) {
     app.set_version_flag("--version", "cdef " CDGEN_VERSION);
     app.require_subcommand(1);
     app.failure_message([](const CLI::App *program, const CLI::Error &usage) {
-        return "cdef: " + complaint(*program, usage) + "\nRun 'cdef --help' for more.\n";
+        return "cdef: " + dump::harmless(complaint(*program, usage)) + "\nRun 'cdef --help' for more.\n";
     });
     int status = OK;
     for (auto add : {add_verify, add_dump, add_diff, add_source, add_check})
@@ -153,9 +159,11 @@ int run(int argc, char **argv) {
 
 int main(int argc, char **argv) {
     try {
-        return cdef::run(argc, argv);
-    } catch (const std::exception &trouble) {
-        std::fprintf(stderr, "cdef: %s\n", trouble.what());
+        try {
+            return cdef::run(argc, argv);
+        } catch (const std::exception &trouble) {
+            cdef::complain(trouble.what());
+        }
     } catch (...) {
         std::fputs("cdef: out of memory\n", stderr);
     }

@@ -1,6 +1,7 @@
 /* cdef_verify.cpp: whether databases are sound, and what is wrong where. */
 
 #include "cdef.h"
+#include "cdef_dump.h"
 
 #include <CLI/CLI.hpp>
 #include <nlohmann/json.hpp>
@@ -37,9 +38,9 @@ std::string place_of(const cdb::finding &f) {
 /* One line, as compilers write them. */
 std::string line_of(const std::string &file, const cdb::finding &f) {
     std::string line;
-    appendf(line, "%s: %s: %s at offset %zu: %s: found %s, expected %s [%s]\n", file.c_str(), name_of(f.broken->level),
-            place_of(f).c_str(), f.offset, std::string(f.broken->title).c_str(), f.found.c_str(), f.expected.c_str(),
-            std::string(f.broken->code).c_str());
+    appendf(line, "%s: %s: %s at offset %zu: %s: found %s, expected %s [%s]\n", dump::harmless(file).c_str(),
+            name_of(f.broken->level), place_of(f).c_str(), f.offset, std::string(f.broken->title).c_str(),
+            f.found.c_str(), f.expected.c_str(), std::string(f.broken->code).c_str());
     return line;
 }
 

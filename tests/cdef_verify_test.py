@@ -215,6 +215,20 @@ class Input(unittest.TestCase):
             )
             self.assertEqual((result.returncode, result.stdout.decode()), (1, WRONG_LINE.format("-x.cdef")))
 
+    def test_names_that_a_terminal_would_act_on(self):
+        name, shown = "a\x1b[2J\\\u202eé", "a\\x1b[2J\\\\xe2\\x80\\xaeé"
+        self.assertEqual(verify(name), (2, "", f"cdef: {shown}: No such file or directory\n"))
+        self.assertEqual(verify("-q", f"-{name}")[2], f"cdef: -{shown}: unknown option\nRun 'cdef --help' for more.\n")
+        with tempfile.TemporaryDirectory() as directory:
+            path = pathlib.Path(directory) / name
+            path.write_bytes((OPTIONS.images / WRONG).read_bytes())
+            self.assertEqual(verify(path), (1, WRONG_LINE.format(f"{directory}/{shown}"), ""))
+            data = bytearray((OPTIONS.images / SOUND).read_bytes())
+            data[4] ^= 1
+            path.write_bytes(data)
+            result = subprocess.run([OPTIONS.cdef, "diff", path, path], capture_output=True, check=False, timeout=60)
+        self.assertEqual(result.stderr.decode(), f"cdef: {directory}/{shown}: wrong checksum\n" * 2)
+
     def test_names_in_brackets(self):
         names = ["[x]", "[x,y]", "[]", "[[x]]"]
         with tempfile.TemporaryDirectory() as directory:

@@ -226,6 +226,7 @@ void add_source(CLI::App &app, int &status) {
     auto path = std::make_shared<std::string>();
     CLI::App *command = app.add_subcommand("source", "Writes a source that compiles to a database that means the same");
     command->add_option("FILE", *path, "The database; - is standard input")->required();
+    command->footer("Exit status: 0 if the source is written, 2 if there is none.");
     command->callback([path, &status] { status = source(*path); });
 }
 

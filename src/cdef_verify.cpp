@@ -100,6 +100,8 @@ void add_verify(CLI::App &app, int &status) {
     command->add_flag("--json", options->as_json, "Findings as JSON");
     command->add_flag("--werror", options->warnings_count, "Warnings count as errors");
     command->add_flag("-q,--quiet", options->quiet, "Show errors only");
+    command->footer("Exit status: 0 if there are no errors (with --werror: no warnings either), 1 if there are, 2 if a "
+                    "file cannot be read.");
     command->callback([options, &status] { status = verify(*options); });
 }
 

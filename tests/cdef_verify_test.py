@@ -8,6 +8,7 @@ import argparse
 import json
 import os
 import pathlib
+import re
 import subprocess
 import sys
 import tempfile
@@ -258,6 +259,14 @@ class Usage(unittest.TestCase):
         (): "A subcommand is required",
         ("dump",): "FILE is required",
     }
+
+    def test_help_ends_in_the_exit_statuses(self):
+        for subcommand, statuses in {"verify": "012", "dump": "02", "diff": "012", "source": "02"}.items():
+            result = subprocess.run(
+                [OPTIONS.cdef, subcommand, "--help"], capture_output=True, text=True, check=True, timeout=60
+            )
+            last = result.stdout.rstrip().rpartition("\n")[2]
+            self.assertEqual(last[:13] + "".join(re.findall(r"\d", last)), "Exit status: " + statuses, result.stdout)
 
     def test_messages(self):
         for arguments, message in self.MESSAGES.items():

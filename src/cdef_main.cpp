@@ -102,7 +102,7 @@ std::vector<std::string> shielded(int argc, char **argv) {
     return arguments;
 }
 
-std::string unshielded(std::string argument) {
+std::string unshielded(const std::string &argument) {
     bool has_shield = argument.starts_with(SHIELD);
     return has_shield && is_in_brackets(std::string_view(argument).substr(SHIELD.size()))
                ? argument.substr(SHIELD.size())

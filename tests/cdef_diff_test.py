@@ -296,7 +296,7 @@ def fields_without_a_line_are_compared(programs, problems):
         "~ ResourceClass 'C': class number 0 -> 3\n",
         "~ ResourceClass 'C': revision 0 -> 2\n",
         "~ ResourceManager 'DiskManager': number 0 -> 4\n",
-        f"~ ResourceManager 'DiskManager': u_rm_strings_table 0 -> {int.from_bytes(bytes([6, 0, 0, 0]), sys.byteorder)}\n",
+        f"~ ResourceManager 'DiskManager': u_rm_strings_table 0 -> {int.from_bytes([6, 0, 0, 0], sys.byteorder)}\n",
         "~ ClassToManagerMapping: rcm_asnno_start 0 -> 5\n",
     ]
     # The largest numbers in the header follow those of the class and the manager.

@@ -712,6 +712,8 @@ public:
     database() = default;
     /* file has to outlive the database and all views that come from it. */
     explicit database(std::span<const std::byte> file);
+    /* read_file's result has to be kept: database(read_file(...)) would read what is gone. */
+    explicit database(const std::vector<std::byte> &&) = delete;
 
     /* The format word says that it is one. If not, this machine's byte order is assumed. */
     bool recognised() const {

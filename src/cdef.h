@@ -41,8 +41,12 @@ struct input {
 };
 
 /* Throws trouble unless the database's records and values can be relied on: it has no errors but, at the most, a wrong
- * checksum or filling that is not zero. */
-void require_readable(const input &in);
+ * checksum or filling that is not zero. Returns what is wrong with it. */
+std::vector<cdb::finding> require_readable(const input &in);
+
+/* The same, and says on standard error which of the two errors it has, each once: for subcommands whose output does not
+ * show it. */
+void require_readable_aloud(const input &in);
 
 /* Appends formatted text, as printf formats it. */
 [[gnu::format(printf, 2, 3)]] void appendf(std::string &to, const char *format, ...);

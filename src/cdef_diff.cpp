@@ -71,7 +71,7 @@ json json_of(const difference &d) {
 
 thing read(const std::string &path, std::unique_ptr<input> &in) {
     in = std::make_unique<input>(path);
-    require_readable(*in);
+    require_readable_aloud(*in);
     try {
         return meaning_of(in->db);
     } catch (const trouble &t) {
@@ -110,6 +110,8 @@ void add_diff(CLI::App &app, int &status) {
     command->add_option("B", options->after, "The other")->required();
     command->add_flag("--compat", options->compat, "Show only what keeps readers of A from reading B, and why");
     command->add_flag("--json", options->as_json, "Differences as JSON");
+    command->footer("Exit status: 0 if they are the same (with --compat: if readers of A can read B), 1 if not, 2 if "
+                    "that cannot be told.");
     command->callback([options, &status] { status = diff(*options); });
 }
 

@@ -427,6 +427,7 @@ void add_dump(CLI::App &app, int &status) {
     auto *hex = command->add_flag("--hex", options->as_hex, "Every byte and what it is, of a damaged file too");
     command->add_flag("--offsets", options->with_offsets, "Also where in the file things stand")->excludes(hex);
     json->excludes(hex);
+    command->footer("Exit status: 0 if the database is shown, 2 if it cannot be.");
     command->callback([options, &status] {
         dump::run(*options);
         status = OK;

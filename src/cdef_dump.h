@@ -63,6 +63,12 @@ std::string quoted(std::string_view bytes);
 /* How many bytes the UTF-8 character in front of bytes takes; 0: there is none. */
 std::size_t utf8_length(std::string_view bytes);
 
+/* The same of one that may go to a terminal as it is; 0 also if it would steer the terminal, or hide. */
+std::size_t printable_length(std::string_view bytes);
+
+/* The text with the same things escaped as in quotes, but for quotes and backslashes: for messages. */
+std::string harmless(std::string_view bytes);
+
 /* Pairs of hexadecimal digits. */
 std::string hex_of(std::span<const std::byte> bytes);
 

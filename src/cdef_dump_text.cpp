@@ -16,11 +16,13 @@ struct range {
     char32_t last;
 };
 
-/* Characters that would steer a terminal, break a line, or hide: controls, and what turns the writing direction or has
- * no width. */
-constexpr range unprintable[] = {{0x0, 0x1F},      {0x7F, 0x9F},     {0xAD, 0xAD},      {0x61C, 0x61C},
-                                 {0x180E, 0x180E}, {0x200B, 0x200F}, {0x2028, 0x202E},  {0x2060, 0x206F},
-                                 {0xFEFF, 0xFEFF}, {0xFFF9, 0xFFFB}, {0xE0000, 0xE0FFF}};
+/* Characters that would steer a terminal, break a line, or hide: controls, separators, what turns the writing
+ * direction, and what Unicode calls default-ignorable, of which nothing is seen. Combining marks are seen, and pass. */
+constexpr range unprintable[] = {{0x0, 0x1F},        {0x7F, 0x9F},       {0xAD, 0xAD},      {0x34F, 0x34F},
+                                 {0x61C, 0x61C},     {0x115F, 0x1160},   {0x17B4, 0x17B5},  {0x180B, 0x180F},
+                                 {0x200B, 0x200F},   {0x2028, 0x202E},   {0x2060, 0x206F},  {0x3164, 0x3164},
+                                 {0xFE00, 0xFE0F},   {0xFEFF, 0xFEFF},   {0xFFA0, 0xFFA0},  {0xFFF0, 0xFFFB},
+                                 {0x1BCA0, 0x1BCA3}, {0x1D173, 0x1D17A}, {0xE0000, 0xE0FFF}};
 
 bool is_printable(char32_t character) {
     return std::none_of(std::begin(unprintable), std::end(unprintable),
@@ -174,20 +176,33 @@ std::size_t utf8_length(std::string_view bytes) {
     return overlong || outside ? 0 : length;
 }
 
-std::string quoted(std::string_view bytes) {
-    std::string shown = "\"";
+std::size_t printable_length(std::string_view bytes) {
+    std::size_t length = utf8_length(bytes);
+    return length != 0 && is_printable(decode(bytes.substr(0, length))) ? length : 0;
+}
+
+/* slashed: characters that get a backslash. */
+static std::string escaped(std::string_view bytes, std::string_view slashed) {
+    std::string shown;
     while (!bytes.empty()) {
-        std::size_t length = utf8_length(bytes);
-        std::string_view character = bytes.substr(0, std::max<std::size_t>(length, 1));
-        if (character == "\"" || character == "\\")
+        std::string_view character = bytes.substr(0, std::max<std::size_t>(utf8_length(bytes), 1));
+        if (slashed.find(character) != std::string_view::npos)
             shown += '\\';
-        if (length != 0 && is_printable(decode(character)))
+        if (printable_length(bytes) != 0)
             shown += character;
         else
             append_escaped(shown, character);
         bytes.remove_prefix(character.size());
     }
-    return shown + "\"";
+    return shown;
+}
+
+std::string quoted(std::string_view bytes) {
+    return '"' + escaped(bytes, "\"\\") + '"';
+}
+
+std::string harmless(std::string_view bytes) {
+    return escaped(bytes, {});
 }
 
 std::string hex_of(std::span<const std::byte> bytes) {

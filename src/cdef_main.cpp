@@ -1,9 +1,11 @@
 /* cdef_main.cpp: cdef, which shows what is in a class definition database. */
 
 #include "cdef.h"
+#include "cdef_dump.h"
 
 #include <CLI/CLI.hpp>
 
+#include <array>
 #include <cerrno>
 #include <cstdarg>
 #include <cstdio>
@@ -16,10 +18,12 @@ namespace cdef {
 
 namespace {
 
-/* What may be wrong with a database that is looked into all the same. */
+/* Errors that a database may have and is looked into all the same. */
+constexpr std::array tolerated = {cdb::CODE_CHECKSUM, cdb::CODE_RESERVED};
+
 bool tolerable(const cdb::finding &finding) {
-    return finding.broken->level == cdb::severity::warning || finding.broken->code == cdb::CODE_CHECKSUM ||
-           finding.broken->code == cdb::CODE_RESERVED;
+    return finding.broken->level == cdb::severity::warning ||
+           std::find(tolerated.begin(), tolerated.end(), finding.broken->code) != tolerated.end();
 }
 
 std::vector<std::byte> contents_of(const std::string &path) {
@@ -32,12 +36,28 @@ std::vector<std::byte> contents_of(const std::string &path) {
 
 } // namespace
 
+/* Names of files are part of messages, and a name may hold anything. */
+static void complain(const std::string &text) {
+    std::fprintf(stderr, "cdef: %s\n", dump::harmless(text).c_str());
+}
+
 input::input(const std::string &path) : name(path), contents(contents_of(path)), db(contents) {}
 
-void require_readable(const input &in) {
+std::vector<cdb::finding> require_readable(const input &in) {
     std::vector<cdb::finding> findings = cdb::verify(in.db);
     if (!std::all_of(findings.begin(), findings.end(), tolerable))
         throw trouble(in.name + ": not a sound database; 'cdef verify' says why");
+    return findings;
+}
+
+void require_readable_aloud(const input &in) {
+    std::vector<cdb::finding> findings = require_readable(in);
+    for (std::string_view code : tolerated) {
+        auto found = std::find_if(findings.begin(), findings.end(),
+                                  [code](const cdb::finding &f) { return f.broken->code == code; });
+        if (found != findings.end())
+            complain(in.name + ": " + std::string(found->broken->title));
+    }
 }
 
 void appendf(std::string &to, const char *format, ...) {
@@ -65,18 +85,63 @@ bool wants_colour() {
 
 namespace {
 
+constexpr std::string_view SHIELD = "./";
+
+/* The library would take an argument [a,b] for two, a and b, and [a] for a. As ./[a,b] it passes; that is the same
+ * file, and the option takes the beginning off again. */
+bool is_in_brackets(std::string_view argument) {
+    return argument.starts_with('[') && argument.ends_with(']');
+}
+
+std::vector<std::string> shielded(int argc, char **argv) {
+    std::vector<std::string> arguments(argv + std::min(1, argc), argv + argc);
+    for (std::string &argument : arguments)
+        if (is_in_brackets(argument))
+            argument.insert(0, SHIELD);
+    std::reverse(arguments.begin(), arguments.end()); /* the library wants the last one first */
+    return arguments;
+}
+
+std::string unshielded(const std::string &argument) {
+    bool has_shield = argument.starts_with(SHIELD);
+    return has_shield && is_in_brackets(std::string_view(argument).substr(SHIELD.size()))
+               ? argument.substr(SHIELD.size())
+               : argument;
+}
+
+void unshield_arguments(CLI::App &app) {
+    for (CLI::App *command : app.get_subcommands([](CLI::App *) { return true; }))
+        for (CLI::Option *option : command->get_options([](CLI::Option *o) { return o->get_items_expected_max() > 0; }))
+            option->transform(unshielded);
+}
+
+/* What is not understood comes before what is missing, which is often missed only because of it. Behind "--" there are
+ * no options. */
+std::string complaint(const CLI::App &app, const CLI::Error &usage) {
+    auto code = static_cast<CLI::ExitCodes>(usage.get_exit_code());
+    std::vector<std::string> unknown = app.remaining(true);
+    auto first = std::find_if(unknown.begin(), unknown.end(), [](const std::string &s) { return s != "--"; });
+    if (first == unknown.end() || (code != CLI::ExitCodes::RequiredError && code != CLI::ExitCodes::ExtrasError))
+        return usage.what();
+    std::string argument = unshielded(*first);
+    if (first == unknown.begin() && argument.size() > 1 && argument.front() == '-')
+        return argument + ": unknown option";
+    return argument + (app.get_subcommands().empty() ? ": unknown subcommand" : ": one operand too many");
+}
+
 int run(int argc, char **argv) {
     CLI::App app("Shows, checks and compares class definition databases.", "cdef");
     app.set_version_flag("--version", "cdef " CDGEN_VERSION);
     app.require_subcommand(1);
-    app.failure_message([](const CLI::App *, const CLI::Error &usage) {
-        return std::string("cdef: ") + usage.what() + "\nRun 'cdef --help' for more.\n";
+    app.failure_message([](const CLI::App *program, const CLI::Error &usage) {
+        return "cdef: " + dump::harmless(complaint(*program, usage)) + "\nRun 'cdef --help' for more.\n";
     });
     int status = OK;
     for (auto add : {add_verify, add_dump, add_diff, add_source, add_check})
         add(app, status);
+    unshield_arguments(app);
     try {
-        app.parse(argc, argv);
+        app.parse(shielded(argc, argv));
     } catch (const CLI::Success &help) {
         app.exit(help);
         std::cout.flush();
@@ -94,9 +159,11 @@ int run(int argc, char **argv) {
 
 int main(int argc, char **argv) {
     try {
-        return cdef::run(argc, argv);
-    } catch (const std::exception &trouble) {
-        std::fprintf(stderr, "cdef: %s\n", trouble.what());
+        try {
+            return cdef::run(argc, argv);
+        } catch (const std::exception &trouble) {
+            cdef::complain(trouble.what());
+        }
     } catch (...) {
         std::fputs("cdef: out of memory\n", stderr);
     }

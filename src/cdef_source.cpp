@@ -5,6 +5,7 @@
 #include "cdb_names.h"
 #include "cdef.h"
 #include "cdef_diff.h"
+#include "cdef_dump.h"
 
 #include <CLI/CLI.hpp>
 
@@ -193,20 +194,27 @@ std::string source_of(const cdb::database &db) {
 }
 
 /* Texts stand in a source as they are; a terminal must not be made to act on them. */
-bool is_harmless(char c) {
-    return (c >= ' ' && c <= '~') || c == '\n' || c == '\t';
+bool is_harmless(std::string_view text) {
+    while (!text.empty()) {
+        bool is_blank = text.front() == '\n' || text.front() == '\t';
+        std::size_t length = is_blank ? 1 : dump::printable_length(text);
+        if (length == 0)
+            return false;
+        text.remove_prefix(length);
+    }
+    return true;
 }
 
 int source(const std::string &path) {
     input in(path);
-    require_readable(in);
+    require_readable_aloud(in);
     std::string text;
     try {
         text = source_of(in.db);
     } catch (const trouble &t) {
         throw trouble(path + ": " + t.what());
     }
-    if (isatty(STDOUT_FILENO) != 0 && !std::all_of(text.begin(), text.end(), is_harmless))
+    if (isatty(STDOUT_FILENO) != 0 && !is_harmless(text))
         throw trouble(path + ": the source has characters that are not for terminals: write it to a file");
     print(text);
     return OK;
@@ -218,6 +226,7 @@ void add_source(CLI::App &app, int &status) {
     auto path = std::make_shared<std::string>();
     CLI::App *command = app.add_subcommand("source", "Writes a source that compiles to a database that means the same");
     command->add_option("FILE", *path, "The database; - is standard input")->required();
+    command->footer("Exit status: 0 if the source is written, 2 if there is none.");
     command->callback([path, &status] { status = source(*path); });
 }
 

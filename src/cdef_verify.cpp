@@ -1,6 +1,7 @@
 /* cdef_verify.cpp: whether databases are sound, and what is wrong where. */
 
 #include "cdef.h"
+#include "cdef_dump.h"
 
 #include <CLI/CLI.hpp>
 #include <nlohmann/json.hpp>
@@ -37,9 +38,9 @@ std::string place_of(const cdb::finding &f) {
 /* One line, as compilers write them. */
 std::string line_of(const std::string &file, const cdb::finding &f) {
     std::string line;
-    appendf(line, "%s: %s: %s at offset %zu: %s: found %s, expected %s [%s]\n", file.c_str(), name_of(f.broken->level),
-            place_of(f).c_str(), f.offset, std::string(f.broken->title).c_str(), f.found.c_str(), f.expected.c_str(),
-            std::string(f.broken->code).c_str());
+    appendf(line, "%s: %s: %s at offset %zu: %s: found %s, expected %s [%s]\n", dump::harmless(file).c_str(),
+            name_of(f.broken->level), place_of(f).c_str(), f.offset, std::string(f.broken->title).c_str(),
+            f.found.c_str(), f.expected.c_str(), std::string(f.broken->code).c_str());
     return line;
 }
 
@@ -94,11 +95,13 @@ int verify(const verify_options &options) {
 void add_verify(CLI::App &app, int &status) {
     auto options = std::make_shared<verify_options>();
     CLI::App *command =
-        app.add_subcommand("verify", "Checks whether databases are sound; says nothing of those that are");
+        app.add_subcommand("verify", "Checks whether databases are sound; says nothing of those without findings");
     command->add_option("FILE", options->files, "Databases; - is standard input")->required();
     command->add_flag("--json", options->as_json, "Findings as JSON");
     command->add_flag("--werror", options->warnings_count, "Warnings count as errors");
     command->add_flag("-q,--quiet", options->quiet, "Show errors only");
+    command->footer("Exit status: 0 if there are no errors (with --werror: no warnings either), 1 if there are, 2 if a "
+                    "file cannot be read.");
     command->callback([options, &status] { status = verify(*options); });
 }
 

@@ -25,7 +25,12 @@ import subprocess
 import sys
 import tempfile
 
-CASES = pathlib.Path(__file__).parent / "cdef" / "diff"
+TESTS = pathlib.Path(__file__).parent
+sys.path.insert(0, str(TESTS / "image"))
+
+import make_images  # noqa: E402  (the path has to be set first)
+
+CASES = TESTS / "cdef" / "diff"
 BLOCKS = ("replace", "with", "diff", "compat")
 TIMEOUT = 60
 TURNED = {"-": "+", "+": "-"}
@@ -55,6 +60,16 @@ class Programs:
             [self.cdef, "diff", *arguments], cwd=self.directory, input=stdin, capture_output=True, timeout=TIMEOUT
         )
         return result.returncode, result.stdout.decode(), result.stderr.decode()
+
+    def image(self, name, order, *changes):
+        """Write an image, with numbers of it changed and its checksum right; the database's name."""
+        data = bytearray(make_images.assemble(TESTS / "image" / f"{name}.image", order))
+        for change in changes:
+            make_images.change(data, "put", change, order)
+        make_images.settle(data, order, [])
+        path = self.directory / f"{name}-{order}-{len(changes)}.cdef"
+        path.write_bytes(data)
+        return path.name
 
     def patch(self, name, offset, data):
         """Write bytes over those of a database."""
@@ -173,6 +188,8 @@ def check_case(programs, path):
 
 # ---- Checks ----------------------------------------------------------------
 
+WRONG_CHECKSUM = "cdef: {}: wrong checksum\n"
+NOT_ZERO = "cdef: {}: reserved bytes or filling not zero\n"
 MAP = base().partition("ClassToManagerMapping\n")[2]
 
 
@@ -198,7 +215,7 @@ def layout_is_not_compared(programs, problems):
     moved = class_source(d, b.replace("\tDefaultValue=x\n", ""), a, head="\tName=C\n")
     second = programs.compile(moved, "second.cdef", "-s", stamp=True)
     programs.patch(second, 4, b"wrong sum"[:4])
-    expect(problems, "diff", programs.diff(first, second), (0, "", ""))
+    expect(problems, "diff", programs.diff(first, second), (0, "", WRONG_CHECKSUM.format(second)))
 
 
 def classes_are_named_where_there_are_several(programs, problems):
@@ -269,6 +286,8 @@ def fields_without_a_line_are_compared(programs, problems):
     name = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
     # Anchors stand at 80; the class at 128 has 224 bytes and strings of 8, the manager 24 and 16, then comes the map.
     places = {12: 1, 92: 2, 128 + 208: 3, 128 + 232 + 4: 4, 128 + 232 + 40 + 30: 5}
+    # The manager's table of strings stands at its end; a reversal leaves it, so it reads as it stands.
+    places[128 + 232 + 16] = 6
     programs.compile(class_source(head="\tName=C\n"), "two.cdef")
     for offset, value in places.items():
         programs.patch("two.cdef", offset, bytes([value]))
@@ -277,11 +296,46 @@ def fields_without_a_line_are_compared(programs, problems):
         "~ ResourceClass 'C': class number 0 -> 3\n",
         "~ ResourceClass 'C': revision 0 -> 2\n",
         "~ ResourceManager 'DiskManager': number 0 -> 4\n",
+        f"~ ResourceManager 'DiskManager': u_rm_strings_table 0 -> {int.from_bytes([6, 0, 0, 0], sys.byteorder)}\n",
         "~ ClassToManagerMapping: rcm_asnno_start 0 -> 5\n",
     ]
     # The largest numbers in the header follow those of the class and the manager.
     programs.patch("two.cdef", 28, bytes([4, 0, 3, 0]))
-    expect(problems, "diff", programs.diff(name, "two.cdef"), (1, "".join(lines), ""))
+    expect(problems, "diff", programs.diff(name, "two.cdef"), (1, "".join(lines), WRONG_CHECKSUM.format("two.cdef")))
+
+
+# What one changed number of an image makes of it: the image, the number, and what there is to say.
+CHANGED_NUMBERS = [
+    ("errors", "u32 320 9", "~ error 'err': re_cb_ID 1 -> 9\n"),
+    ("errors", "u32 324 -2", "~ error 'err': Id 2 -> -2\n"),
+    ("errors", "u32 328 16", "~ error 'err': properties 0x3 -> 0x10\n"),
+    ("errors", "u16 332 9", "~ error 'err': description 4 -> 9\n"),
+    ("errors", "u16 334 9", "~ error 'err': display name 5 -> 9\n"),
+    ("errors", "u32 336 0", "- error 'err'\n+ error 'E'\n"),
+    ("errors", "u32 360 1", "~ error 'err': permission 0x6 -> q\n"),
+    ("errors", "u32 388 5", "- error 'err', variety 1 to 1\n+ error 'err', variety 1 to 5\n"),
+    ("errors", "u32 400 0", "- error 'err', input element 'err'\n+ error 'err', input element 'E'\n"),
+    ("errors", "u32 368 9", "~ dependency 8: rd_cb_ID 7 -> 9\n"),
+    ("errors", "u16 372 9", "- dependency 8\n+ dependency 9\n"),
+    ("hash", "u32 96 9", "~ class hash: rch_cb_ID 1 -> 9\n"),
+    ("hash", "u32 8304 9", "~ class hash, block 4: hash value 3 -> 9\n"),
+    ("hash", "u32 8308 9", "- class hash, block 4\n+ class hash, block 9\n"),
+]
+
+
+def records_that_are_never_written_are_compared(programs, problems):
+    """Errors, dependencies and a class hash: the compiler makes none, but there may be some."""
+    for name, number, text in CHANGED_NUMBERS:
+        for a, b in itertools.product(make_images.ORDERS, repeat=2):
+            one, two = programs.image(name, a), programs.image(name, b, number)
+            expect(problems, f"{name} {number} {a} {b}", programs.diff(one, two), (1, text, ""))
+
+
+def places_in_a_class_hash_are_not_compared(programs, problems):
+    """The head of a chain, a block's link and its class."""
+    for order in make_images.ORDERS:
+        one, two = programs.image("hash", order), programs.image("hash", order, "u32 100 8", "u32 8296 9", "u32 8312 9")
+        expect(problems, order, programs.diff(one, two), (0, "", ""))
 
 
 def json_says_the_same(programs, problems):
@@ -318,6 +372,21 @@ def one_may_be_standard_input(programs, problems):
     expect(problems, "both", programs.diff("-", "-", stdin=contents)[:2], (2, ""))
 
 
+def what_is_tolerated_is_told(programs, problems):
+    """A wrong checksum and reserved bytes that are not 0: a line for each kind and database, whatever the status."""
+    one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
+    two = programs.compile(class_source(attribute("A", 1), head="\tName=C\n"), "two.cdef")
+    programs.patch(two, 60, b"\1")  # two of the header's spare bytes, which cancel out in the checksum
+    programs.patch(two, 64, b"\1")
+    added, gone = "+ PersistentResourceAttribute 'A'\n", "- PersistentResourceAttribute 'A' (readers miss it)\n"
+    expect(problems, "reserved", programs.diff(one, two), (1, added, NOT_ZERO.format(two)))
+    programs.patch(two, 68, b"\1")
+    said = WRONG_CHECKSUM.format(two) + NOT_ZERO.format(two)
+    expect(problems, "both", programs.diff(one, two), (1, added, said))
+    expect(problems, "--compat", programs.diff("--compat", two, one), (1, gone, said))
+    expect(problems, "same", programs.diff("--compat", one, two), (0, "", said))
+
+
 def trouble_is_status_2(programs, problems):
     """A file that is not there, that is no database, or that is broken."""
     one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
@@ -338,8 +407,11 @@ CHECKS = [
     values_of_every_type,
     missing_values_are_nothing,
     fields_without_a_line_are_compared,
+    records_that_are_never_written_are_compared,
+    places_in_a_class_hash_are_not_compared,
     json_says_the_same,
     one_may_be_standard_input,
+    what_is_tolerated_is_told,
     trouble_is_status_2,
 ]
 

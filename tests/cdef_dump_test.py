@@ -29,10 +29,12 @@ import unicodedata
 
 import cdb_image
 import cdef_dump_listing
+import documents
 
 HERE = pathlib.Path(__file__).resolve().parent
 CASES = HERE / "cdef" / "dump"
 EXAMPLES = HERE.parent / "examples"
+README = HERE.parent / "README.md"
 TIMEOUT = 60
 OK, TROUBLE = 0, 2
 OTHER = {"little": "big", "big": "little"}
@@ -242,6 +244,35 @@ def case_no_database_is_refused():
     expect(regions, [(0, b"something else", "unreached")], "bytes of something else")
 
 
+def readme_commands():
+    """(arguments, what is shown) of the commands that the README gives cdef."""
+    block = next(block for block in documents.blocks(README) if "$ cdef dump" in block)
+    parts = re.split(r"^\$ cdef ([^>\n]*).*\n", block, flags=re.M)[1:]
+    return list(zip(parts[::2], parts[1::2]))
+
+
+def case_readme_shows_what_there_is():
+    """The README's commands print what it says, of the class that it shows; it leaves out lines at "..."."""
+    source = documents.sources(README)[0]
+    changed = source.replace("DefaultValue=4096", "DefaultValue=8192")
+    expect([command.split()[0] for command, _ in readme_commands()], ["verify", "dump", "diff", "source"], "commands")
+    with tempfile.TemporaryDirectory() as name:
+        for directory, text in ((name, source), (f"{name}/new", changed)):
+            os.makedirs(directory, exist_ok=True)
+            (pathlib.Path(directory) / "disk.cdefsrc").write_text(text)
+            subprocess.run([PROGRAMS.cdgen, "disk.cdefsrc", "disk.cdef"], cwd=directory, check=True, timeout=TIMEOUT)
+        for command, shown in readme_commands():
+            result = subprocess.run(
+                [PROGRAMS.cdef, *command.split()], cwd=name, capture_output=True, text=True, timeout=TIMEOUT
+            )
+            expect((result.returncode, result.stderr), (int(command.startswith("diff")), ""), command)
+            if "..." not in shown and not command.startswith("source"):
+                expect(result.stdout, shown, command)
+            for lines in re.split(r"^ *\.\.\.\n", shown, flags=re.M):
+                expect(lines in result.stdout, True, f"{command}: {lines!r} in {result.stdout!r}")
+        expect(result.stdout.startswith("#"), True, "a source")
+
+
 def case_wrong_checksum_is_told():
     """The display message number 2 became 3; 3 ^ 2 = 1 changes the word's upper half."""
     data = patched(database("minimal"), 340, b"\x03")
@@ -376,6 +407,12 @@ TEXTS = [
     ("\u202e\u200b\u2028\ufeff\u2066".encode(),
      '"\\xe2\\x80\\xae\\xe2\\x80\\x8b\\xe2\\x80\\xa8\\xef\\xbb\\xbf\\xe2\\x81\\xa6"',
      "\u202e\u200b\u2028\ufeff\u2066"),
+    ("\u034f\u3164\ufe0f\u115f\u180f".encode(),
+     '"\\xcd\\x8f\\xe3\\x85\\xa4\\xef\\xb8\\x8f\\xe1\\x85\\x9f\\xe1\\xa0\\x8f"', "\u034f\u3164\ufe0f\u115f\u180f"),
+    ("\U0001bca0\U0001d173\uffa0\ufff0\u17b4".encode(),
+     '"\\xf0\\x9b\\xb2\\xa0\\xf0\\x9d\\x85\\xb3\\xef\\xbe\\xa0\\xef\\xbf\\xb0\\xe1\\x9e\\xb4"',
+     "\U0001bca0\U0001d173\uffa0\ufff0\u17b4"),
+    ("e\u0301".encode(), '"e\u0301"', "e\u0301"),
     (b"\xff", '"\\xff"', {"bytes": "ff"}),
     (b"cut \xe2\x82", '"cut \\xe2\\x82"', {"bytes": "63757420e282"}),
     (b"long \xc0\xaf \xe0\x80\xaf \xf0\x80\x80\xaf", '"long \\xc0\\xaf \\xe0\\x80\\xaf \\xf0\\x80\\x80\\xaf"',

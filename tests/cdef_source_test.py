@@ -13,6 +13,7 @@ generated sources, in both byte orders.
 import argparse
 import os
 import pathlib
+import pty
 import subprocess
 import sys
 import tempfile
@@ -133,7 +134,60 @@ def check_generated(programs, group):
     return problems
 
 
+# ---- What is no case --------------------------------------------------------
+
+
+def check_tolerated(programs):
+    """Of a database that is looked into though its checksum is wrong, that is said, and the source is the same."""
+    with tempfile.TemporaryDirectory() as name:
+        directory = pathlib.Path(name)
+        text = (CASES / "canonical.cdefsrc").read_bytes()
+        database = bytearray(programs.compile(directory, text, "out.cdef", swap=False)[0])
+        expected = programs.source(directory, database).stdout
+        database[4] ^= 1
+        result = programs.source(directory, database)
+    message = f"cdef: {DATABASE}: wrong checksum\n".encode()
+    actual = (result.returncode, result.stdout, result.stderr)
+    return [] if actual == (0, expected, message) and expected else [f"{actual}"]
+
+
+def on_terminal(programs, directory):
+    """Status, what is seen and the message of the source of the database in a directory, written to a terminal."""
+    master, slave = pty.openpty()
+    with os.fdopen(master, "rb", buffering=0) as screen:
+        command = [programs.cdef, "source", DATABASE]
+        with subprocess.Popen(command, cwd=directory, stdout=slave, stderr=subprocess.PIPE) as process:
+            os.close(slave)
+            shown = b""
+            try:
+                while part := screen.read(65536):
+                    shown += part
+            except OSError:  # how a terminal ends
+                pass
+            return process.wait(TIMEOUT), shown.replace(b"\r\n", b"\n"), process.stderr.read()
+
+
+def check_terminal(programs):
+    """A terminal gets a source if there is nothing in it that the terminal would act on or hide."""
+    text = (CASES / "canonical.cdefsrc").read_bytes()
+    refusal = f"cdef: {DATABASE}: the source has characters that are not for terminals: write it to a file\n".encode()
+    shown = [text.encode() for text in ("plain", "é €\U0001f600", "e\u0301")]
+    hidden = [b"\xe9", *(text.encode() for text in ("\x1b[1m", "\u202e", "\ufe0f"))]
+    problems = []
+    for name in shown + hidden:
+        with tempfile.TemporaryDirectory() as place:
+            directory = pathlib.Path(place)
+            database, message = programs.compile(directory, text.replace(b"mgr1.cat", name), "out.cdef", swap=False)
+            written = programs.source(directory, database).stdout
+            expected = (0, written, b"") if name in shown else (TROUBLE, b"", refusal)
+            if name not in written or on_terminal(programs, directory) != expected:
+                problems.append(f"{name}: {message}{on_terminal(programs, directory)}")
+    return problems
+
+
 PROPERTIES = {
+    "on-a-terminal": check_terminal,
+    "what-is-tolerated-is-told": check_tolerated,
     "all-golden-sources": lambda programs: check_sources(programs, golden_sources()),
     "all-other-sources": lambda programs: check_sources(programs, plain_sources()),
     **{

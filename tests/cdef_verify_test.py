@@ -8,11 +8,13 @@ import argparse
 import json
 import os
 import pathlib
+import re
 import subprocess
 import sys
 import tempfile
 import unittest
 
+import documents
 import golden
 
 OPTIONS = argparse.Namespace()
@@ -138,6 +140,13 @@ class Json(unittest.TestCase):
         self.assertEqual(list(self.parsed(1, WRONG)[0]), ["file", "sound", "findings"])
         self.assertEqual(list(self.parsed(1, WRONG)[0]["findings"][0]), list(WRONG_FINDING))
 
+    def test_document_names_the_keys(self):
+        """In their order; a row may name several."""
+        chapter = dict(documents.chapters(HERE.parent / "docs" / "reader.md", 2))["cdef verify"]
+        of_file, of_finding = documents.tables(chapter)[-2:]
+        for table, expected in ((of_file, self.parsed(0, SOUND)[0]), (of_finding, WRONG_FINDING)):
+            self.assertEqual([key for row in table[1:] for key in documents.spans(row[0])], list(expected))
+
     def test_of_the_file_as_a_whole(self):
         self.assertIsNone(self.parsed(1, OF_THE_FILE)[0]["findings"][0]["section"])
 
@@ -206,6 +215,68 @@ class Input(unittest.TestCase):
                 [OPTIONS.cdef, "verify", "--", "-x.cdef"], cwd=directory, capture_output=True, check=False, timeout=60
             )
             self.assertEqual((result.returncode, result.stdout.decode()), (1, WRONG_LINE.format("-x.cdef")))
+
+    def test_names_that_a_terminal_would_act_on(self):
+        name, shown = "a\x1b[2J\\\u202eé", "a\\x1b[2J\\\\xe2\\x80\\xaeé"
+        self.assertEqual(verify(name), (2, "", f"cdef: {shown}: No such file or directory\n"))
+        self.assertEqual(verify("-q", f"-{name}")[2], f"cdef: -{shown}: unknown option\nRun 'cdef --help' for more.\n")
+        with tempfile.TemporaryDirectory() as directory:
+            path = pathlib.Path(directory) / name
+            path.write_bytes((OPTIONS.images / WRONG).read_bytes())
+            self.assertEqual(verify(path), (1, WRONG_LINE.format(f"{directory}/{shown}"), ""))
+            data = bytearray((OPTIONS.images / SOUND).read_bytes())
+            data[4] ^= 1
+            path.write_bytes(data)
+            result = subprocess.run([OPTIONS.cdef, "diff", path, path], capture_output=True, check=False, timeout=60)
+        self.assertEqual(result.stderr.decode(), f"cdef: {directory}/{shown}: wrong checksum\n" * 2)
+
+    def test_names_in_brackets(self):
+        names = ["[x]", "[x,y]", "[]", "[[x]]"]
+        with tempfile.TemporaryDirectory() as directory:
+            for name in names:
+                (pathlib.Path(directory) / name).write_bytes((OPTIONS.images / WRONG).read_bytes())
+            result = subprocess.run(
+                [OPTIONS.cdef, "verify", *names], cwd=directory, capture_output=True, text=True, check=False, timeout=60
+            )
+        expected = "".join(WRONG_LINE.format(name) for name in names)
+        self.assertEqual((result.returncode, result.stdout, result.stderr), (1, expected, ""))
+
+
+class Usage(unittest.TestCase):
+    """What is said of a wrong command line: what is not understood before what is missing."""
+
+    MESSAGES = {
+        ("dmp", "FILE"): "dmp: unknown subcommand",
+        ("dmp", "--json", "-"): "dmp: unknown subcommand",
+        ("[dump]",): "[dump]: unknown subcommand",
+        ("--nothing", "dump", "FILE"): "--nothing: unknown option",
+        ("dump", "-x"): "-x: unknown option",
+        ("dump", "--", "-x", "-y"): "-y: one operand too many",
+        ("verify", "--jsn"): "--jsn: unknown option",
+        ("check", "--jsn"): "--jsn: unknown option",
+        ("source", "A", "B", "C"): "B: one operand too many",
+        ("diff", "A", "[B]", "[C]"): "[C]: one operand too many",
+        (): "A subcommand is required",
+        ("dump",): "FILE is required",
+    }
+
+    def test_help_ends_in_the_exit_statuses(self):
+        for subcommand, statuses in {"verify": "012", "dump": "02", "diff": "012", "source": "02"}.items():
+            result = subprocess.run(
+                [OPTIONS.cdef, subcommand, "--help"], capture_output=True, text=True, check=True, timeout=60
+            )
+            last = result.stdout.rstrip().rpartition("\n")[2]
+            self.assertEqual(last[:13] + "".join(re.findall(r"\d", last)), "Exit status: " + statuses, result.stdout)
+
+    def test_messages(self):
+        for arguments, message in self.MESSAGES.items():
+            with self.subTest(arguments):
+                result = subprocess.run(
+                    [OPTIONS.cdef, *arguments], stdin=subprocess.DEVNULL, capture_output=True, text=True, check=False,
+                    timeout=60,
+                )
+                expected = (2, "", f"cdef: {message}\nRun 'cdef --help' for more.\n")
+                self.assertEqual((result.returncode, result.stdout, result.stderr), expected)
 
 
 @unittest.skipUnless(pathlib.Path("/dev/full").exists(), "a device that is always full is needed")
@@ -287,14 +358,27 @@ STRAY_RANGES = {
 }
 
 
+def expected_warnings():
+    """The codes of the warnings that each careless golden source is known for, by case."""
+    lines = (HERE / "cdef" / "verify" / "golden-warnings.txt").read_text().splitlines()
+    cases = [line.split(": ") for line in lines if line and not line.startswith("#")]
+    return {name: codes.split() for name, codes in cases}
+
+
 class Compiled(unittest.TestCase):
-    """What the compiler makes has no errors."""
+    """What the compiler makes has no errors, and only careless sources have warnings."""
 
     def expect_sound(self, database, what):
         self.assertEqual(verify("-q", database), (0, "", ""), what)
 
+    def codes_of(self, database):
+        status, text, messages = verify("--json", database)
+        self.assertEqual((status, messages), (0, ""), text)
+        return [finding["code"] for finding in json.loads(text)[0]["findings"]]
+
     def test_golden_sources_in_both_orders(self):
-        count = 0
+        expected = expected_warnings()
+        sound = set()
         with tempfile.TemporaryDirectory() as directory:
             database = pathlib.Path(directory) / "made.cdef"
             for path in golden.cases_of([HERE / "golden"]):
@@ -302,9 +386,11 @@ class Compiled(unittest.TestCase):
                 for extra in ([], ["-s"]) if case.status == 0 else ():
                     _, _, after = golden.run(case, OPTIONS.cdgen, extra)
                     database.write_bytes(after[case.out])
-                    self.expect_sound(database, f"{case.name} {extra}")
-                    count += 1
-        self.assertGreater(count, 200)
+                    name = path.with_suffix("").relative_to(HERE / "golden").as_posix()
+                    self.assertEqual(self.codes_of(database), expected.get(name, []), f"{name} {extra}")
+                    sound.add(name)
+        self.assertGreater(len(sound), 100)
+        self.assertLessEqual(set(expected), sound, "cases that are no more")
 
     def compile(self, source, directory, extra):
         path = pathlib.Path(directory) / "made.cdefsrc"

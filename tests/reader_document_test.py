@@ -1,8 +1,9 @@
 """Compile and run what docs/reader.md shows.
 
 Every C++ block has to compile by itself, without a warning.  The first one is a
-program: what it prints of the example's database has to be what the document
-says, in both byte orders; and of a file that is no database nothing.
+program, short enough to be read at a glance: what it prints of the example's
+database has to be what the document says, in both byte orders; and of a file
+that is no database nothing.
 """
 
 import argparse
@@ -13,6 +14,7 @@ import sys
 import tempfile
 
 BLOCK = re.compile(r"^```(\w*)\n(.*?)^```$", re.MULTILINE | re.DOTALL)
+PROGRAM_LINES = 30
 WARNINGS = ["-Wall", "-Wextra", "-Werror"]
 
 
@@ -52,6 +54,7 @@ def main():
     document = options.document.read_text()
     sources, expected = blocks(document, "cpp"), blocks(document, "")
     assert len(sources) >= 2 and len(expected) == 1, "blocks are missing in the document"
+    assert len(sources[0].splitlines()) <= PROGRAM_LINES, "the program has grown"
     with tempfile.TemporaryDirectory() as name:
         directory = pathlib.Path(name)
         program = compile_blocks(sources, options, directory)

@@ -32,6 +32,12 @@ cdb::resource_class disk(const cdb::database &db) {
 
 /* ---- The file -------------------------------------------------------------------------------------------------- */
 
+/* database(read_file(...)) would refer to bytes that are gone. */
+static_assert(!std::is_constructible_v<cdb::database, std::vector<std::byte>>);
+static_assert(!std::is_constructible_v<cdb::database, const std::vector<std::byte>>);
+static_assert(std::is_constructible_v<cdb::database, std::vector<std::byte> &>);
+static_assert(std::is_constructible_v<cdb::database, const std::vector<std::byte> &>);
+
 TEST(CdbViewDatabase, FormatWordTellsTheByteOrder) {
     for (std::endian order : both_orders) {
         std::vector<std::byte> image = load("whole", order);

@@ -34,13 +34,6 @@ const char *form_of(vx_data_type_t type) {
     }
 }
 
-vx_data_type_t data_type(cdgen &cx) {
-    vx_data_type_t type = VX_UNKNOWN;
-    if (cx.scp->dt_offset >= 0)
-        memcpy(&type, static_cast<char *>(cx.scp->sc_cb(cx)) + cx.scp->dt_offset, sizeof type);
-    return type;
-}
-
 int line_of(const session &check, int kind, const char *attribute) {
     const srtable_ctrl &table = sc_tables[index_of(kind)];
     const table_attrs *attr = find_attr(table, attribute);

@@ -37,7 +37,7 @@ struct pending_range {
     std::string source; /* the line */
 };
 
-/* Texts, with the line that gave each first. There may be very many. */
+/* Texts, with the line that gave each first (cdef_check_lines.cpp). There may be very many. */
 class first_lines {
 public:
     /* The line for a text, which is 0 if it is a new one. */
@@ -103,7 +103,7 @@ struct session {
 
     void run();
 
-    /* The line, and its findings (cdef_check_run.cpp). */
+    /* The line, and its findings (cdef_check_run.cpp, cdef_check_recover.cpp). */
     void take(const source_line &line);
     void take_header(const attr_text &text, bool guessed);
     void take_quietly(std::string_view text);
@@ -138,7 +138,7 @@ struct session {
     /* Notes (cdef_check_notes.cpp). */
     void add_notes(finding &found, const fatal_exit &failure, int kind);
 
-    /* Warnings (cdef_check_warn.cpp). */
+    /* Warnings (cdef_check_warn.cpp, cdef_check_numbers.cpp). */
     void watch_line(const source_line &line);
     void watch_header(int kind);
     void watch_stanza_end(int next_kind);
@@ -192,6 +192,19 @@ constexpr size_t index_of(int kind) {
 
 inline bool is_sd_kind(int kind) {
     return sc_tables[index_of(kind)].sc_sd_owner != nullptr;
+}
+
+/* Of the current stanza; unknown if its kind has none. */
+inline vx_data_type_t data_type(cdgen &cx) {
+    vx_data_type_t type = VX_UNKNOWN;
+    if (cx.scp->dt_offset >= 0)
+        memcpy(&type, static_cast<char *>(cx.scp->sc_cb(cx)) + cx.scp->dt_offset, sizeof type);
+    return type;
+}
+
+inline bool is_numeric(vx_data_type_t type) {
+    vx_data_type_t scalar = scalar_vx(type);
+    return scalar >= VX_INT32 && scalar <= VX_FLOAT64;
 }
 
 } // namespace cdef::check

@@ -3,9 +3,6 @@
 #include "cdef_check_session.h"
 
 #include <algorithm>
-#include <cerrno>
-#include <cstdlib>
-#include <limits>
 
 namespace cdef::check {
 
@@ -24,67 +21,6 @@ bool is_attribute_run(int kind) {
 bool is_action_run(int kind) {
     return kind == SC_ACTION_IN_SD_DEFINITION || kind == SC_ACTION_OUT_SD_DEFINITION;
 }
-
-vx_data_type_t data_type(cdgen &cx) {
-    vx_data_type_t type = VX_UNKNOWN;
-    memcpy(&type, static_cast<char *>(cx.scp->sc_cb(cx)) + cx.scp->dt_offset, sizeof type);
-    return type;
-}
-
-bool is_numeric(vx_data_type_t type) {
-    vx_data_type_t scalar = scalar_vx(type);
-    return scalar >= VX_INT32 && scalar <= VX_FLOAT64;
-}
-
-/* A number as the C library reads it. Plain ones are read without it. */
-struct number {
-    explicit number(std::string_view given, int base) : text(given) {
-        constexpr size_t SAFE_DIGITS = 18;
-        bool plain = !text.empty() && text.size() <= SAFE_DIGITS && (text[0] != '0' || text.size() == 1 || base == 10);
-        for (; plain && read < text.size() && text[read] >= '0' && text[read] <= '9'; ++read)
-            value = value * 10 + (text[read] - '0');
-        if (read == 0 || read < text.size())
-            convert(base);
-    }
-
-    void convert(int base) {
-        std::string copy(text);
-        errno = 0;
-        char *stop = nullptr;
-        value = std::strtol(copy.c_str(), &stop, base);
-        overflow = errno == ERANGE;
-        read = static_cast<size_t>(stop - copy.c_str());
-    }
-
-    std::string_view rest() const {
-        std::string_view left = text.substr(read);
-        return left.substr(std::min(left.find_first_not_of(" \t"), left.size()));
-    }
-
-    std::string_view text;
-    long value = 0;
-    size_t read = 0;
-    bool overflow = false;
-};
-
-/* Low and high of "low,high", with the offset of the second; both are the whole text if there is no comma. */
-struct pair_of_texts {
-    explicit pair_of_texts(std::string_view text) : low(text), high(text) {
-        size_t comma = text.find(',');
-        if (comma == std::string_view::npos)
-            return;
-        low = text.substr(0, comma);
-        high = text.substr(comma + 1);
-        offset = comma + 1;
-    }
-
-    bool two() const {
-        return offset > 0;
-    }
-
-    std::string_view low, high;
-    size_t offset = 0;
-};
 
 } // namespace
 
@@ -183,7 +119,6 @@ void session::watch_attribute() {
     switch (attr.ta_type) {
     case AT_STRING:
     case AT_SD_NAME:
-    case AT_ID:
         return watch_name();
     case AT_LOCATOR:
         seen.locator = mention{at, std::string(text), raw};
@@ -227,125 +162,6 @@ void session::watch_attribute() {
     }
 }
 
-/* ---- Numbers -------------------------------------------------------------------------------------------------- */
-
-/* A number16 or number32, or one part of it. */
-void session::watch_number(std::string_view text, size_t offset, int bits) {
-    number n(text, 0);
-    place at = value_part(offset, text.size());
-    long limit = (1L << bits) - 1;
-    if (n.read == 0 || !n.rest().empty())
-        warn(NUMBER_TEXT, at,
-             n.read == 0 ? "no number: it is read as 0"
-                         : "only the number in front counts: it is read as " + std::to_string(n.value));
-    if (n.overflow || n.value < 0 || n.value > limit)
-        warn(NARROWED, at,
-             "does not fit " + std::to_string(bits) + " bits: it is stored as " + std::to_string(n.value & limit));
-    size_t digits = text.find_first_not_of(" \t+-");
-    bool octal = digits != std::string_view::npos && digits + 1 < n.read && text[digits] == '0' &&
-                 text[digits + 1] >= '0' && text[digits + 1] <= '7';
-    if (octal)
-        warn(OCTAL, at, "a leading 0 makes it octal: it is read as " + std::to_string(n.value));
-}
-
-/* A value of the attribute's own type, or one part of it. */
-void session::watch_typed(std::string_view text, size_t offset) {
-    vx_data_type_t type = scalar_vx(data_type(cx));
-    place at = value_part(offset, text.size());
-    if (type != VX_INT32 && type != VX_UINT32 && type != VX_UINT64)
-        return;
-    number n(text, 10);
-    if (type == VX_INT32 && (n.overflow || n.value != static_cast<vx_int32_t>(n.value)))
-        warn(NARROWED, at, "does not fit Int32: it is stored as " + std::to_string(static_cast<vx_int32_t>(n.value)));
-    if (type == VX_UINT32 && (n.overflow || n.value != static_cast<long>(static_cast<vx_uint32_t>(n.value))))
-        warn(NARROWED, at, "does not fit UInt32: it is stored as " + std::to_string(static_cast<vx_uint32_t>(n.value)));
-    if (type == VX_UINT64 && n.value < 0)
-        warn(NARROWED, at, "does not fit UInt64: it is stored as " + std::to_string(static_cast<vx_uint64_t>(n.value)));
-}
-
-void session::watch_version() {
-    std::string_view text = value_text();
-    size_t offset = 0;
-    for (int part = 0; part < 4 && offset <= text.size(); ++part) {
-        size_t dot = std::min(text.find('.', offset), text.size());
-        std::string_view piece = text.substr(offset, dot - offset);
-        number n(piece, 10);
-        if (!n.rest().empty())
-            warn(NUMBER_TEXT, value_part(offset, piece.size()),
-                 "only the number in front counts: it is read as " + std::to_string(n.value));
-        if (n.overflow || n.value < 0 || n.value > 255)
-            warn(NARROWED, value_part(offset, piece.size()), "a part of a version has 8 bits");
-        offset = dot + 1;
-    }
-    if (offset <= text.size())
-        warn(NUMBER_TEXT, value_part(offset, text.size() - offset), "a version has four parts: these are cut off");
-}
-
-void session::watch_numbers() {
-    std::string_view text = value_text();
-    switch (cx.latest.attr->ta_type) {
-    case AT_UINT16:
-    case AT_SD_DESCRIPTION:
-    case AT_SD_DISPLAY:
-    case AT_VALUE_DISPLAY:
-    case AT_SD_VALUE_DISPLAY:
-        return watch_number(text, 0, 16);
-    case AT_ID:
-        return watch_number(text, 0, 32);
-    case AT_VARIETY: {
-        pair_of_texts both(text);
-        watch_number(both.low, 0, 32);
-        watch_number(both.high, both.offset, 32);
-        return watch_bounds();
-    }
-    case AT_VERSION:
-        return watch_version();
-    case AT_DEFAULT_VALUE:
-    case AT_INITIAL_VALUE:
-        return watch_typed(text, 0);
-    case AT_VALID_VALUE:
-    case AT_SD_VALID_VALUE:
-    case AT_RANGE:
-        return watch_valid(text);
-    default:
-        return;
-    }
-}
-
-void session::watch_valid(std::string_view text) {
-    if (!is_numeric(data_type(cx)))
-        return;
-    pair_of_texts both(text);
-    watch_typed(both.low, 0);
-    if (!both.two())
-        return;
-    watch_typed(both.high, both.offset);
-    watch_bounds();
-}
-
-/* Values that fit their type; others have been warned of. */
-void session::watch_bounds() {
-    std::string_view text = value_text();
-    pair_of_texts both(text);
-    if (!both.two())
-        return;
-    bool variety = cx.latest.attr->ta_type == AT_VARIETY;
-    vx_data_type_t type = variety ? VX_UINT32 : scalar_vx(data_type(cx));
-    bool above = false;
-    if (type == VX_FLOAT32 || type == VX_FLOAT64) {
-        above =
-            std::strtod(std::string(both.low).c_str(), nullptr) > std::strtod(std::string(both.high).c_str(), nullptr);
-    } else if (type == VX_UINT64) {
-        above = std::strtoull(std::string(both.low).c_str(), nullptr, 10) >
-                std::strtoull(std::string(both.high).c_str(), nullptr, 10);
-    } else {
-        int base = variety ? 0 : 10;
-        above = number(both.low, base).value > number(both.high, base).value;
-    }
-    if (above)
-        warn(LOW_ABOVE_HIGH, value_part(0, cx.latest.length), "the lower bound is above the upper one");
-}
-
 /* ---- Names, ranges, quotes ------------------------------------------------------------------------------------ */
 
 void session::watch_name() {
@@ -359,10 +175,6 @@ void session::watch_name() {
     known_values &known = seen.known[index_of(kind)];
     if ((attr == "Name" || attr == "ElementName") && kind != SC_RESOURCE_CLASS)
         watch_first(SAME_NAME, known.names.of(text), at, "name");
-    if (attr == "Id") {
-        auto id = static_cast<vx_uint32_t>(number(text, 0).value);
-        watch_first(SAME_ID, known.ids.of(id), at, "Id");
-    }
 }
 
 void session::watch_first(warning_id id, int &first, const place &at, const char *what) {
@@ -430,64 +242,6 @@ void session::watch_end() {
                     {{named.at, suggestion(named.text, seen.defined_variable_classes.all())}});
     for (finding &found : out.findings)
         std::erase_if(found.notes, [](const note &each) { return each.text.empty(); });
-}
-
-/* ---- Texts and their first lines ------------------------------------------------------------------------------ */
-
-static unsigned tag_of(size_t hash) {
-    return static_cast<unsigned>(hash >> 32);
-}
-
-size_t first_lines::slot_of(std::string_view text, size_t hash) const {
-    size_t mask = slots.size() - 1;
-    size_t at = hash & mask;
-    for (; slots[at].position != 0; at = (at + 1) & mask)
-        if (slots[at].tag == tag_of(hash) && text_of(entries[slots[at].position - 1]) == text)
-            break;
-    return at;
-}
-
-void first_lines::grow() {
-    constexpr size_t FEWEST = 64;
-    size_t size = std::max(FEWEST, 2 * slots.size());
-    slots.assign(size, {0, 0});
-    for (size_t i = 0; i < entries.size(); ++i) {
-        size_t at = entries[i].hash & (size - 1);
-        while (slots[at].position != 0)
-            at = (at + 1) & (size - 1);
-        slots[at] = {tag_of(entries[i].hash), static_cast<unsigned>(i + 1)};
-    }
-}
-
-int &first_lines::of(std::string_view text, size_t hash) {
-    if (2 * entries.size() >= slots.size())
-        grow();
-    slot &found = slots[slot_of(text, hash)];
-    if (found.position == 0) {
-        entries.push_back({hash, texts.size(), text.size(), 0});
-        texts += text;
-        found = {tag_of(hash), static_cast<unsigned>(entries.size())};
-    }
-    return entries[found.position - 1].line;
-}
-
-bool first_lines::has(std::string_view text) const {
-    return !slots.empty() && slots[slot_of(text, std::hash<std::string_view>()(text))].position != 0;
-}
-
-name_list first_lines::all() const {
-    name_list names;
-    for (const entry &each : entries)
-        names.push_back(text_of(each));
-    return names;
-}
-
-void first_lines::clear() {
-    if (entries.empty())
-        return;
-    texts.clear();
-    entries.clear();
-    std::fill(slots.begin(), slots.end(), slot{0, 0});
 }
 
 } // namespace cdef::check

@@ -82,6 +82,7 @@ struct place {
 struct note {
     place at;
     std::string text;
+    std::string source = {}; /* the line, if it is to be shown: the finding itself has no place in it */
 };
 
 struct finding {
@@ -116,6 +117,10 @@ std::string suggestion(std::string_view text, const name_list &names);
 
 name_list stanza_names();
 name_list attribute_names(const srtable_ctrl &kind);
+
+/* The stanza kinds that have an attribute of this name, as bits. */
+vx_uint32_t kinds_with(std::string_view name);
+
 name_list data_type_names();
 name_list variable_type_names();
 name_list property_names(int attr_type);

@@ -81,6 +81,14 @@ name_list attribute_names(const srtable_ctrl &kind) {
     return names;
 }
 
+vx_uint32_t kinds_with(std::string_view name) {
+    vx_uint32_t kinds = 0;
+    for (int kind = 0; kind < SC_COUNT; ++kind)
+        if (find_attr(sc_tables[static_cast<size_t>(kind)], name) != nullptr)
+            kinds |= 1u << kind;
+    return kinds;
+}
+
 name_list data_type_names() {
     return {std::begin(vxTypeStr) + 1, std::end(vxTypeStr)}; /* the first stands for none */
 }

@@ -114,6 +114,14 @@ void session::watch_version() {
         warn(NUMBER_TEXT, value_part(offset, text.size() - offset), "a version has four parts: these are cut off");
 }
 
+/* What is no number has been told of. */
+void session::watch_id(std::string_view text) {
+    number n(text, 0);
+    if (n.read > 0)
+        watch_first(SAME_ID, seen.known[index_of(kind)].ids.of(static_cast<vx_uint32_t>(n.value)),
+                    value_part(0, text.size()), "Id");
+}
+
 void session::watch_numbers() {
     std::string_view text = value_text();
     switch (cx.latest.attr->ta_type) {
@@ -125,8 +133,7 @@ void session::watch_numbers() {
         return watch_number(text, 0, 16);
     case AT_ID:
         watch_number(text, 0, 32);
-        return watch_first(SAME_ID, seen.known[index_of(kind)].ids.of(static_cast<vx_uint32_t>(number(text, 0).value)),
-                           value_part(0, text.size()), "Id");
+        return watch_id(text);
     case AT_VARIETY: {
         pair_of_texts both(text);
         watch_number(both.low, 0, 32);

@@ -39,11 +39,22 @@ constexpr vx_uint32_t bit_of(int attr_type) {
     return 1u << attr_type;
 }
 
+constexpr vx_uint32_t EVERY_KIND = bit_of(SC_COUNT) - 1;
 constexpr vx_uint32_t VALID_VALUES = bit_of(AT_VALID_VALUE) | bit_of(AT_SD_VALID_VALUE);
 constexpr vx_uint32_t TYPED = VALID_VALUES | bit_of(AT_DEFAULT_VALUE) | bit_of(AT_INITIAL_VALUE) | bit_of(AT_RANGE);
 
 bool is_message(const message &known, const char *code) {
     return std::string_view(known.code) == code;
+}
+
+/* What a stanza mostly begins with. */
+bool is_name(std::string_view attribute) {
+    return attribute == "Name" || attribute == "VariableClass";
+}
+
+std::string_view name_in(const attr_text &text) {
+    std::string_view line(text.name, static_cast<size_t>(text.end - text.name));
+    return line.substr(0, line.find('='));
 }
 
 } // namespace
@@ -52,6 +63,22 @@ bool is_message(const message &known, const char *code) {
 bool session::may_follow(const fatal_exit &failure) {
     const message &known = message_of(failure);
     return out.errors == 0 || known.whose != blame::program;
+}
+
+/* Whether the stanza that an error misses has been told of: it is broken, or its header is lost. */
+bool session::told_otherwise(const fatal_exit &failure) const {
+    const message &known = message_of(failure);
+    bool map_broken = cx.stanzas[SC_CLASS_TO_MANAGER_MAPPING].broken;
+    if (is_message(known, "S301") || is_message(known, "S117"))
+        return may_be_lost(SC_CONTROL_DEFINITION);
+    if (is_message(known, "S302"))
+        return may_be_lost(SC_CLASS_TO_MANAGER_MAPPING);
+    if (is_message(known, "S303")) /* without a map, that has been told */
+        return map_broken || map_line == 0;
+    if (is_message(known, "S304"))
+        return map_broken;
+    bool element_type = is_message(known, "S214") || is_message(known, "S215") || is_message(known, "S216");
+    return element_type && types_told && odd_elements.empty();
 }
 
 /* A text to be taken as the current line, in the place of the one that the parser has taken apart. */
@@ -71,6 +98,14 @@ void session::forge_class() {
     class_forged = true;
 }
 
+/* What is not completed has no use for its ranges. */
+void session::drop_record(int dropped) {
+    close_record(cx, dropped);
+    int begun = stanzas[index_of(dropped)].header.line;
+    std::erase_if(seen.ranges,
+                  [&](const pending_range &range) { return range.kind == dropped && range.at.line >= begun; });
+}
+
 /* What has been reported is not completed: its record is dropped before the compiler comes to it. */
 void session::settle_broken(int next_kind) {
     if (cx.cb_sd_def.sd_cb_ID != 0 && cx.stanzas[index_of(sd_kind)].broken)
@@ -80,13 +115,13 @@ void session::settle_broken(int next_kind) {
     for (int each : {SC_PERSISTENT_RESOURCE_ATTRIBUTE, SC_PERSISTENT_CLASS_ATTRIBUTE, SC_DYNAMIC_RESOURCE_ATTRIBUTE,
                      SC_DYNAMIC_CLASS_ATTRIBUTE, SC_RESOURCE_ACTION, SC_CLASS_ACTION})
         if (is_open(cx, each) && cx.stanzas[index_of(each)].broken)
-            close_record(cx, each);
+            drop_record(each);
 }
 
 /* A record whose completion failed. */
 void session::abandon(int failed_kind, const fatal_exit &failure) {
     if (!is_sd_kind(failed_kind))
-        close_record(cx, failed_kind);
+        drop_record(failed_kind);
     else if (is_message(message_of(failure), "S111"))
         complete_element(cx);
     else
@@ -121,7 +156,12 @@ void session::open_stanza(int new_kind, bool broken) {
     if (!same_run) { /* after a mistake it may be the rest of a run */
         index_lost = kind < 0 || cx.stanzas[index_of(kind)].broken;
         other_index = -1;
+        odd_elements.clear();
+        types_told = false;
+        index_missing = 0;
     }
+    if (!is_sd_kind(new_kind))
+        owner_lost = false;
     kind = new_kind;
     if (is_sd_kind(kind))
         sd_kind = kind;
@@ -131,7 +171,7 @@ void session::open_stanza(int new_kind, bool broken) {
     stanza.given.fill(0);
     stanza.failed = 0;
     stanza.misplaced = false;
-    stanza.data_type = {};
+    stanza.data_type.at = {};
     stanza.header = all_of_line();
     stanza.source = raw;
     if (kind == SC_CLASS_TO_MANAGER_MAPPING)
@@ -143,14 +183,14 @@ bool session::recover_header(const fatal_exit &failure, int new_kind) {
     const message &known = message_of(failure);
     if (cx.completing >= 0) {
         int failed = is_sd_kind(cx.completing) ? sd_kind : cx.completing;
-        if (!cx.stanzas[index_of(failed)].broken && may_follow(failure))
+        if (!cx.stanzas[index_of(failed)].broken && !told_otherwise(failure) && may_follow(failure))
             add_notes(error(failure, here(mark_kind::none)), failure, failed);
         splits_stanza = splits_stanza || (failed == kind && out.errors > header_errors);
         abandon(failed, failure);
         return true;
     }
     if (cx.cb_rsrc_class.rc_cb_ID == 0 && std::string_view(failure.msg).starts_with("No class for")) {
-        if (!header_lost)
+        if (!may_be_lost(SC_CONTROL_DEFINITION))
             add_notes(error(failure, all_of_line()), failure, new_kind);
         header_told = true;
         forge_class();
@@ -166,10 +206,39 @@ bool session::recover_header(const fatal_exit &failure, int new_kind) {
         open_stanza(new_kind, true);
         stanzas[index_of(new_kind)].misplaced = true;
         index_lost = true;
+    } else if (is_message(known, "S118")) {
+        give_up_map();
     } else {
         skip_stanza();
     }
     return false;
+}
+
+/* Behind a second map's header: what the first lacks may be here. One of which there is a header only goes on. */
+void session::give_up_map() {
+    stanza_state &map = cx.stanzas[SC_CLASS_TO_MANAGER_MAPPING];
+    if (kind == SC_CLASS_TO_MANAGER_MAPPING && !skipping && map.req_mask == 0)
+        return;
+    map.broken = map.broken || map.req_mask != sc_tables[SC_CLASS_TO_MANAGER_MAPPING].req_mask_cmplt;
+    skip_stanza();
+}
+
+/* The stanza kind that a line names that is no attribute line: nearly, or in a skipped stanza exactly. */
+std::string_view session::header_meant(const attr_text &text, const fatal_exit &failure) const {
+    const message &known = message_of(failure);
+    bool whole = is_message(known, "S103") || is_message(known, "S102");
+    return whole ? near_miss({text.name, static_cast<size_t>(text.end - text.name)}, stanza_names())
+                 : std::string_view();
+}
+
+/* A header with blanks in front. */
+void session::indented_header(std::string_view meant, const fatal_exit &failure) {
+    bool exact = std::string_view(line.name) == meant;
+    finding &found = error(failure, all_of_line());
+    found.notes.push_back({all_of_line(), "a stanza begins in column 1"});
+    if (!exact)
+        found.notes.push_back({all_of_line(), suggestion(line.name, stanza_names())});
+    take_header(again(meant), !exact);
 }
 
 /* A header that names no kind: of an attribute line without its blank, a near miss, or lost. */
@@ -207,8 +276,15 @@ void session::unknown_header(const attr_text &text, const fatal_exit &failure) {
     watch_stanza_end(-1);
     if (kind >= 0 && cx.stanzas[index_of(kind)].req_mask != sc_tables[index_of(kind)].req_mask_cmplt)
         cx.stanzas[index_of(kind)].broken = true; /* the rest of it may be what is skipped */
-    header_lost = true;
+    lose_header(EVERY_KIND);
     skip_stanza();
+}
+
+/* A stanza of one of these kinds, as bits, is there without its header. */
+void session::lose_header(vx_uint32_t kinds) {
+    constexpr vx_uint32_t actions = bit_of(SC_CLASS_ACTION) | bit_of(SC_RESOURCE_ACTION);
+    lost_kinds |= kinds;
+    owner_lost = owner_lost || (kinds & actions) != 0;
 }
 
 void session::skip_stanza() {
@@ -261,10 +337,14 @@ void session::take_header(const attr_text &text, bool guessed) {
     skip_stanza();
 }
 
+std::string_view session::name_given() const {
+    place at = here(mark_kind::name);
+    return std::string_view(raw).substr(at.column - 1, at.length);
+}
+
 /* What a line that could not be read seems to have been. */
 vx_uint32_t session::type_meant() const {
-    place at = here(mark_kind::name);
-    std::string_view name = std::string_view(raw).substr(at.column - 1, at.length);
+    std::string_view name = name_given();
     const table_attrs *attr = find_attr(*cx.scp, name);
     if (std::string_view meant = near_miss(name, attribute_names(*cx.scp)); attr == nullptr && !meant.empty())
         attr = find_attr(*cx.scp, meant);
@@ -272,60 +352,130 @@ vx_uint32_t session::type_meant() const {
 }
 
 /* Whether a line belongs to another stanza, as one before it did. Notes it if it is the first: a second name, or an
- * attribute that this kind does not have. */
+ * attribute that other kinds have and this one has not. */
 bool session::misplaced(const fatal_exit &failure) {
     const message &known = message_of(failure);
     bool unknown = is_message(known, "S106") && (type_meant() & LOST_NAME) != 0;
     bool repeated = is_message(known, "S109");
     bool &before = stanzas[index_of(kind)].misplaced;
     if (before)
-        return unknown || repeated || is_message(known, "S208");
-    if (unknown && cx.prev_scp != nullptr) { /* what is missed there is perhaps here */
+        return unknown || repeated || is_message(known, "S207") || is_message(known, "S208");
+    bool named = repeated && (cx.latest.attr == cx.scp->sc_attrs.data() || is_name(name_given()));
+    vx_uint32_t kinds = unknown || named ? kinds_with(name_given()) : 0;
+    before = kinds != 0;
+    if (!before)
+        return false;
+    lose_header(kinds);
+    index_lost = index_lost || is_sd_kind(kind); /* this may be another run by now */
+    if (unknown && cx.prev_scp != nullptr) {     /* what is missed there is perhaps here */
         stanza_state &previous = cx.stanzas[static_cast<size_t>(cx.prev_scp - sc_tables.data())];
         previous.broken = previous.broken || previous.req_mask != cx.prev_scp->req_mask_cmplt;
     }
-    before = unknown || (repeated && cx.latest.attr == &sc_tables[index_of(kind)].sc_attrs[0]);
     return false;
+}
+
+/* A value that is refused because its element has no known type: told of here, and not at the run's end as well. */
+void session::tell_type() {
+    int type_line = stanzas[index_of(kind)].data_type.at.line;
+    types_told =
+        std::erase_if(odd_elements, [&](const mention &odd) { return odd.at.line == type_line; }) > 0 || types_told;
+    tell_instead(ELEMENT_TYPE, type_line);
+}
+
+/* Behind an attribute line in front of any header. */
+void session::lose_first_header(const attr_text &text, const fatal_exit &failure) {
+    vx_uint32_t kinds = kinds_with(name_in(text));
+    add_notes(error(failure, all_of_line()), failure, -1);
+    lose_header(kinds == 0 ? EVERY_KIND : kinds);
+    skip_stanza();
+}
+
+/* Whether an attribute's error is a consequence of one that has been told. */
+bool session::attribute_follows(const fatal_exit &failure) {
+    const message &known = message_of(failure);
+    if (is_message(known, "S210"))
+        return index_lost || (other_index >= 0 && cx.curr_sdeli == other_index);
+    if (is_message(known, "S117"))
+        return told_otherwise(failure);
+    const stanza_note &stanza = stanzas[index_of(kind)];
+    bool typed = cx.latest.attr != nullptr && (bit_of(cx.latest.attr->ta_type) & TYPED) != 0;
+    bool untyped = cx.state->broken && cx.scp->dt_offset >= 0 && data_type(cx) == VX_UNKNOWN;
+    if (typed && untyped && is_message(known, "S207"))
+        return true;
+    if (is_message(known, "S208") && (stanza.failed & (VALID_VALUES | LOST_NAME)) != 0)
+        return true;
+    return misplaced(failure);
+}
+
+/* Behind a wrong index: either the counting goes on from it, or it is passed over. */
+void session::recover_index(bool follows) {
+    other_index = follows ? -1 : cx.expected_sdeli + 1;
+    bool read = cx.curr_sdeli + 1 != cx.expected_sdeli;
+    cx.expected_sdeli = read ? cx.curr_sdeli + 1 : cx.expected_sdeli + 1;
+    index_lost = false;
+}
+
+/* What an error has told is not told as a warning as well. */
+void session::tell_instead(warning_id id, int at_line) {
+    out.warnings -= std::erase_if(out.findings, [&](const finding &found) {
+        return found.at.line == at_line && std::string_view(found.code) == warnings[id].code;
+    });
+}
+
+/* What else the error of an attribute leaves to be done, besides its stanza's being broken. */
+void session::recover_value(const fatal_exit &failure, bool follows) {
+    const message &known = message_of(failure);
+    if (is_message(known, "S210")) {
+        if (!follows)
+            tell_instead(INCOMPLETE, index_missing);
+        recover_index(follows);
+    }
+    if (is_message(known, "S117"))
+        forge_class();
+    if (is_sd_kind(kind) && is_message(known, "S207") && data_type(cx) == VX_UNKNOWN)
+        tell_type();
 }
 
 void session::recover_attribute(const fatal_exit &failure) {
     const message &known = message_of(failure);
-    if (kind < 0) { /* before any header */
-        error(failure, all_of_line());
-        return skip_stanza();
-    }
-    stanza_state &state = *cx.state;
-    stanza_note &stanza = stanzas[index_of(kind)];
-    int type = cx.latest.attr == nullptr ? -1 : cx.latest.attr->ta_type;
-    vx_uint32_t type_bit = type < 0 ? 0 : bit_of(type);
-    bool untyped = state.broken && cx.scp->dt_offset >= 0 && data_type(cx) == VX_UNKNOWN;
-    bool follows = (untyped && (type_bit & TYPED) != 0 && is_message(known, "S207")) ||
-                   (is_message(known, "S208") && (stanza.failed & (VALID_VALUES | LOST_NAME)) != 0) ||
-                   misplaced(failure);
-    bool index = is_message(known, "S210");
-    if (index)
-        follows = index_lost || (other_index >= 0 && cx.curr_sdeli == other_index);
-    if (is_message(known, "S117")) {
-        follows = header_lost;
-        forge_class();
-    }
+    if (std::string_view meant = header_meant(line, failure); !meant.empty())
+        return indented_header(meant, failure);
+    if (kind < 0)
+        return lose_first_header(line, failure);
+    bool follows = attribute_follows(failure);
     if (!follows && may_follow(failure))
         add_notes(error(failure, here(known.mark, &failure)), failure, kind);
-    if (index) {
-        other_index = follows ? -1 : cx.expected_sdeli + 1;
-        bool read = cx.curr_sdeli + 1 != cx.expected_sdeli;
-        cx.expected_sdeli = read ? cx.curr_sdeli + 1 : cx.expected_sdeli + 1;
-        index_lost = false;
-    }
-    state.broken = true;
-    stanza.failed |= type_bit;
-    if (type < 0)
-        stanza.failed |= type_meant();
-    if (is_message(known, "S108")) {
-        stanza.failed &= ~type_bit;
+    if (overflow_told)
+        tell_instead(NARROWED, overflow_line);
+    overflow_told = false;
+    recover_value(failure, follows);
+    cx.state->broken = true;
+    stanza_note &stanza = stanzas[index_of(kind)];
+    if (is_message(known, "S108"))
         take_quietly(std::string_view(raw).substr(0, all_of_line().column - 1 + all_of_line().length));
-    }
+    else
+        stanza.failed |= cx.latest.attr == nullptr ? type_meant() : bit_of(cx.latest.attr->ta_type);
     cx.conv_errno = 0; /* its mark would be a second report of the same number */
+}
+
+const mention *session::map_value(std::string_view attribute) const {
+    auto found =
+        std::find_if(map_values.begin(), map_values.end(), [&](const mention &each) { return each.text == attribute; });
+    return found == map_values.end() ? nullptr : &*found;
+}
+
+/* Whether the step of the end is to be tried again, without the record that it failed for. */
+bool session::recover_end(const fatal_exit &failure) {
+    int failed = cx.completing < 0 ? -1 : is_sd_kind(cx.completing) ? sd_kind : cx.completing;
+    bool told = failed >= 0 && cx.stanzas[index_of(failed)].broken;
+    if (!told && !told_otherwise(failure) && may_follow(failure)) {
+        add_notes(error(failure, here(mark_kind::none)), failure, failed);
+        if (is_message(message_of(failure), "S304") && map_value("LastKey") == nullptr)
+            tell_instead(INCOMPLETE, map_line);
+    }
+    if (failed >= 0)
+        abandon(failed, failure);
+    return failed >= 0;
 }
 
 } // namespace cdef::check

@@ -97,7 +97,7 @@ place session::here(mark_kind what, const fatal_exit *failure) const {
 /* ---- Attribute lines --------------------------------------------------------------------------------------------- */
 
 void session::take_attribute(const attr_text &text) {
-    if (skipping)
+    if (skipping && set_table_id(text.name) < 0)
         return;
     cx.latest = {};
     int conversions = cx.conv_errno;
@@ -123,6 +123,8 @@ void session::note_given() {
         given = cx.linenum;
     if (cx.latest.attr->ta_type == AT_MANAGER)
         manager_line = cx.linenum;
+    if (kind == SC_CLASS_TO_MANAGER_MAPPING)
+        map_values.push_back({value_part(0, cx.latest.length), cx.latest.attr->ta_name, raw});
     if (cx.latest.attr->ta_type == AT_SD_INDEX)
         index_lost = false;
 }
@@ -157,14 +159,8 @@ void session::close_all() {
                 step(cx);
                 break;
             } catch (const fatal_exit &failure) {
-                int failed = cx.completing < 0 ? -1 : is_sd_kind(cx.completing) ? sd_kind : cx.completing;
-                bool told = failed >= 0 && cx.stanzas[index_of(failed)].broken;
-                bool lost = header_lost && std::string_view(failure.msg).starts_with("No ");
-                if (!told && !lost && may_follow(failure))
-                    add_notes(error(failure, here(mark_kind::none)), failure, failed);
-                if (failed < 0)
+                if (!recover_end(failure))
                     break;
-                abandon(failed, failure);
             }
         }
         ranges_settled(resource_open, class_open, -1);

@@ -13,21 +13,21 @@ constexpr size_t ATTRS_MAX = 32;            /* attributes of one kind */
 constexpr vx_uint32_t ELEMENT_INDEX = 0x8;  /* in an SD kind's req_mask */
 constexpr vx_uint32_t LOST_NAME = 1u << 31; /* in failed: an attribute whose name is not known */
 
-/* The latest stanza of a kind. */
-struct stanza_note {
-    place header;
-    std::array<int, ATTRS_MAX> given = {}; /* line of each attribute, by its position in the kind; 0: none */
-    vx_uint32_t failed = 0;                /* bits by attr_type, of attributes whose value was refused */
-    place data_type;                       /* the value of its DataType */
-    bool misplaced = false;                /* lines of another stanza seem to be in it */
-    std::string source;                    /* the header's line */
-};
-
 /* A name or a number at a place of the source. */
 struct mention {
     place at;
     std::string text;
     std::string source; /* the line */
+};
+
+/* The latest stanza of a kind. */
+struct stanza_note {
+    place header;
+    std::array<int, ATTRS_MAX> given = {}; /* line of each attribute, by its position in the kind; 0: none */
+    vx_uint32_t failed = 0;                /* bits by attr_type, of attributes whose value was refused */
+    mention data_type;                     /* the value of its DataType */
+    bool misplaced = false;                /* lines of another stanza seem to be in it */
+    std::string source;                    /* the header's line */
 };
 
 /* A Range that has not yet been settled with its attribute. */
@@ -87,7 +87,9 @@ struct known_values {
 struct watch {
     std::array<known_values, SC_COUNT> known; /* of the current class, or run */
     std::vector<pending_range> ranges;
-    std::vector<mention> variable_classes; /* named by attributes */
+    std::vector<mention> variable_classes; /* named by attributes, */
+    first_lines variable_class_names;      /* each once; */
+    bool variable_class_unnamed = false;   /* and one that has been told to lack its name may be any of them */
     first_lines defined_variable_classes;
     std::optional<mention> locator;
     std::string sd_source; /* the line of */
@@ -110,19 +112,37 @@ struct session {
     void skip_stanza();
     void note_given();
     bool lost_index(int new_kind) const;
+    std::string_view name_given() const;
     vx_uint32_t type_meant() const;
     bool misplaced(const fatal_exit &failure);
     void take_attribute(const attr_text &text);
     bool recover_header(const fatal_exit &failure, int kind);
     void recover_attribute(const fatal_exit &failure);
+    bool attribute_follows(const fatal_exit &failure);
+    void recover_index(bool follows);
+    void recover_value(const fatal_exit &failure, bool follows);
+    void tell_instead(warning_id id, int at_line);
     void open_stanza(int kind, bool broken);
     void unknown_header(const attr_text &text, const fatal_exit &failure);
+    std::string_view header_meant(const attr_text &text, const fatal_exit &failure) const;
+    void indented_header(std::string_view meant, const fatal_exit &failure);
+    void lose_first_header(const attr_text &text, const fatal_exit &failure);
+    void lose_header(vx_uint32_t kinds);
+    bool may_be_lost(int each) const {
+        return (lost_kinds >> each & 1) != 0;
+    }
+    void give_up_map();
+    void tell_type();
     void finish_run_by_hand(int kind);
     void settle_broken(int next_kind);
     void abandon(int kind, const fatal_exit &failure);
+    void drop_record(int dropped);
     void forge_class();
     void close_all();
+    const mention *map_value(std::string_view attribute) const;
+    bool recover_end(const fatal_exit &failure);
     bool may_follow(const fatal_exit &failure);
+    bool told_otherwise(const fatal_exit &failure) const;
     attr_text again(std::string_view text);
 
     finding &error(const fatal_exit &failure, const place &at);
@@ -142,7 +162,9 @@ struct session {
     void watch_line(const source_line &line);
     void watch_header(int kind);
     void watch_stanza_end(int next_kind);
+    void watch_complete();
     void watch_attribute();
+    void note_type(std::string_view text);
     void watch_number(std::string_view text, size_t offset, int bits);
     void watch_numbers();
     void watch_typed(std::string_view text, size_t offset);
@@ -150,6 +172,8 @@ struct session {
     void watch_valid(std::string_view text);
     void watch_version();
     void watch_name();
+    void watch_variable_class(std::string_view text, const place &at);
+    void watch_id(std::string_view text);
     void watch_first(warning_id id, int &first, const place &at, const char *what);
     std::string_view value_text() const;
     void watch_range();
@@ -168,11 +192,15 @@ struct session {
     int sd_kind = SC_PATTR_SD_DEFINITION; /* of the latest run */
     bool class_forged = false;            /* the class has no stanza */
     int overflow_line = 0;                /* of the latest number that left its mark on later ones */
-    std::vector<mention> odd_elements;    /* DataType lines of the run that its default may fail for */
+    bool overflow_told = false;           /* by the note of an error */
+    std::vector<mention> odd_elements;    /* DataType lines of the run that its default may fail for; */
+    bool types_told = false;              /* and there were others, which have been told of */
     bool skipping = false;                /* nothing of the current stanza can be made sense of */
-    bool header_lost = false;             /* there was a stanza that could have been any */
+    vx_uint32_t lost_kinds = 0;           /* bits of what stanzas without a header may have been */
+    bool owner_lost = false;              /* one of them may have been the action that a run belongs to */
     bool strip_returns = false;           /* the file has been found to have them everywhere */
     bool index_lost = false;              /* the run's indexes have been found wrong */
+    int index_missing = 0;                /* header of the run's latest element that has been told to lack one */
     int other_index = -1;                 /* an index that may be right as well, once one was wrong */
     size_t header_errors = 0;             /* when the current header was met */
     bool header_told = false;             /* it has been told that it stands in a wrong place */
@@ -180,6 +208,7 @@ struct session {
     int error_line = 0;                   /* of the latest error */
     bool rest_of_line = false;            /* the current line goes on with the one before */
     int map_line = 0;
+    std::vector<mention> map_values; /* by the names of their attributes */
     int manager_line = 0;
     cdb_ref_t nobody = {}; /* what refers to the elements of a run that belongs to nothing */
     std::array<stanza_note, SC_COUNT> stanzas;

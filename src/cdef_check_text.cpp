@@ -43,13 +43,13 @@ std::string carets(std::string_view source, const place &at) {
     return text + "^" + std::string(width > 1 ? width - 1 : 0, '~');
 }
 
-std::string excerpt(const finding &found) {
-    if (found.at.line == 0 || found.at.column == 0)
+std::string excerpt(const place &at, const std::string &source) {
+    if (at.line == 0 || at.column == 0)
         return {};
-    std::string number = std::to_string(found.at.line);
+    std::string number = std::to_string(at.line);
     std::string margin(std::max<size_t>(number.size(), 5), ' ');
-    return margin.substr(number.size()) + number + " | " + visible(found.source) + "\n" + margin + " | " +
-           carets(found.source, found.at) + "\n";
+    return margin.substr(number.size()) + number + " | " + visible(source) + "\n" + margin + " | " +
+           carets(source, at) + "\n";
 }
 
 } // namespace
@@ -59,9 +59,12 @@ std::string as_text(const result &checked) {
     for (const finding &found : checked.findings) {
         text += prefix(checked.file, found.at) + (found.error ? "error: " : "warning: ") + visible(found.text) + " [" +
                 found.code + (found.error ? "" : std::string(" ") + found.name) + "]\n";
-        text += excerpt(found);
-        for (const note &more : found.notes)
+        text += excerpt(found.at, found.source);
+        for (const note &more : found.notes) {
             text += prefix(checked.file, more.at) + "note: " + visible(more.text) + "\n";
+            if (!more.source.empty())
+                text += excerpt(more.at, more.source);
+        }
     }
     return text;
 }

@@ -61,11 +61,22 @@ static name_list unchecked_missing(session &check) {
     return names;
 }
 
+void session::watch_complete() {
+    name_list names = unchecked_missing(*this);
+    const stanza_note &stanza = stanzas[index_of(kind)];
+    if (names.empty() || !warn_at(INCOMPLETE, stanza.header, stanza.source,
+                                  quoted(sc_tables[index_of(kind)].sc_name) + " lacks " + listed(names)))
+        return;
+    if (is_sd_kind(kind))
+        index_missing = stanza.header.line;
+    bool unnamed = std::find(names.begin(), names.end(), "VariableClass") != names.end();
+    seen.variable_class_unnamed = seen.variable_class_unnamed || unnamed;
+}
+
 void session::watch_stanza_end(int next_kind) {
-    if (kind >= 0 && !skipping && !cx.stanzas[index_of(kind)].broken)
-        if (name_list names = unchecked_missing(*this); !names.empty())
-            warn_at(INCOMPLETE, stanzas[index_of(kind)].header, stanzas[index_of(kind)].source,
-                    quoted(sc_tables[index_of(kind)].sc_name) + " lacks " + listed(names));
+    bool map_again = kind == SC_CLASS_TO_MANAGER_MAPPING && next_kind == kind; /* which is an error */
+    if (kind >= 0 && !skipping && !map_again && !cx.stanzas[index_of(kind)].broken)
+        watch_complete();
     bool runs_on = next_kind >= 0 && is_attribute_run(next_kind);
     bool reported = seen.sd_attribute.line == 0;
     if (reported || runs_on) {
@@ -84,11 +95,10 @@ void session::watch_stanza_end(int next_kind) {
 
 void session::watch_header(int new_kind) {
     bool begins_run = is_sd_kind(new_kind) && (cx.cb_sd_def.sd_cb_ID == 0 || kind != new_kind);
-    if (begins_run) {
+    if (begins_run)
         seen.known[index_of(new_kind)].names.clear();
-        odd_elements.clear();
-    }
-    if (begins_run && is_action_run(new_kind) && cx.cb_rsrc_action.ac_cb_ID == 0 && cx.cb_rsrc_actionC.ac_cb_ID == 0)
+    if (begins_run && is_action_run(new_kind) && !owner_lost && cx.cb_rsrc_action.ac_cb_ID == 0 &&
+        cx.cb_rsrc_actionC.ac_cb_ID == 0)
         warn(STRAY_RUN, all_of_line(), "no action is open: these elements belong to nothing");
     if (new_kind != SC_CONTROL_DEFINITION || cx.cb_rsrc_class.rc_cb_ID == 0)
         return;
@@ -108,6 +118,14 @@ void session::watch_header(int new_kind) {
     }
 }
 
+/* In place: this is done for each attribute and element. */
+void session::note_type(std::string_view text) {
+    mention &type = stanzas[index_of(kind)].data_type;
+    type.at = value_part(0, text.size());
+    type.text = text;
+    type.source = raw;
+}
+
 /* ---- Attributes ----------------------------------------------------------------------------------------------- */
 
 void session::watch_attribute() {
@@ -115,6 +133,8 @@ void session::watch_attribute() {
     std::string_view text = value_text();
     place at = value_part(0, cx.latest.length);
     watch_quotes();
+    if (stanzas[index_of(kind)].misplaced)
+        return; /* the value may be another attribute's */
     watch_numbers();
     switch (attr.ta_type) {
     case AT_STRING:
@@ -141,7 +161,7 @@ void session::watch_attribute() {
         return;
     }
     case AT_DATA_TYPE:
-        stanzas[index_of(kind)].data_type = at;
+        note_type(text);
         if (scalar_vx(data_type(cx)) == VX_SD_PTR) {
             seen.sd_attribute = stanzas[index_of(kind)].header;
             seen.sd_source = stanzas[index_of(kind)].source;
@@ -150,8 +170,9 @@ void session::watch_attribute() {
         return;
     case AT_SD_DATA_TYPE: {
         bool unknown = data_type(cx) == VX_UNKNOWN;
+        note_type(text);
         if (cx.attr_dflt_val != nullptr && (unknown || text == "SBS"))
-            odd_elements.push_back({at, std::string(text), {}});
+            odd_elements.push_back({at, std::string(text), raw});
         else if (unknown)
             warn(ELEMENT_TYPE, at, "unknown data type: the element gets none",
                  {{at, suggestion(text, data_type_names())}});
@@ -171,10 +192,17 @@ void session::watch_name() {
     if (attr == "VariableClass" && kind == SC_RESOURCE_VARIABLE_CLASS)
         seen.defined_variable_classes.of(text) = cx.linenum;
     if (attr == "VariableClass" && kind != SC_RESOURCE_VARIABLE_CLASS)
-        seen.variable_classes.push_back({at, std::string(text), raw});
+        watch_variable_class(text, at);
     known_values &known = seen.known[index_of(kind)];
     if ((attr == "Name" || attr == "ElementName") && kind != SC_RESOURCE_CLASS)
         watch_first(SAME_NAME, known.names.of(text), at, "name");
+}
+
+void session::watch_variable_class(std::string_view text, const place &at) {
+    int &first = seen.variable_class_names.of(text);
+    if (first == 0)
+        seen.variable_classes.push_back({at, std::string(text), raw});
+    first = cx.linenum;
 }
 
 void session::watch_first(warning_id id, int &first, const place &at, const char *what) {
@@ -204,8 +232,9 @@ void session::ranges_settled(bool resource_was_open, bool class_was_open, int ne
     if ((!of_resource && !of_class) || next_kind == SC_CONTROL_DEFINITION)
         return;
     int completed = of_resource ? SC_DYNAMIC_RESOURCE_ATTRIBUTE : SC_DYNAMIC_CLASS_ATTRIBUTE;
+    bool lost = may_be_lost(SC_DYNAMIC_RESOURCE_ATTRIBUTE) || may_be_lost(SC_DYNAMIC_CLASS_ATTRIBUTE);
     for (const pending_range &range : seen.ranges)
-        if (range.kind != completed)
+        if (range.kind != completed && !lost)
             warn_at(RANGE_ELSEWHERE, range.at, range.source,
                     "this Range is lost: a " + quoted(sc_tables[index_of(completed)].sc_name) + " is completed first",
                     {{stanzas[index_of(completed)].header, "begun here"}});
@@ -237,7 +266,7 @@ void session::watch_end() {
                 "no `PersistentResourceAttribute` has this name",
                 {{seen.locator->at, suggestion(seen.locator->text, attributes.all())}});
     for (const mention &named : seen.variable_classes)
-        if (!seen.defined_variable_classes.has(named.text))
+        if (!seen.variable_class_unnamed && !seen.defined_variable_classes.has(named.text))
             warn_at(UNKNOWN_VARIABLE_CLASS, named.at, named.source, "no `ResourceVariableClass` has this name",
                     {{named.at, suggestion(named.text, seen.defined_variable_classes.all())}});
     for (finding &found : out.findings)

@@ -6,7 +6,9 @@
 #include "cdef.h"
 
 #include <algorithm>
+#include <fcntl.h>
 #include <memory>
+#include <unistd.h>
 
 namespace cdef::check {
 
@@ -26,7 +28,7 @@ std::string words_of(const fatal_exit &failure) {
 session::session(const std::string &path, const warning_set &wanted_warnings, result &into)
     : wanted(wanted_warnings), out(into) {
     cx.checking = true;
-    cx.cdefsrc = path == "-" ? "/dev/stdin" : path.c_str();
+    cx.cdefsrc = path.c_str();
     cx.cdefname = CLASS_NAME;
 }
 
@@ -176,7 +178,10 @@ void session::close_all() {
 
 void session::run() {
     try {
-        open_source(cx, cx.cdefsrc);
+        if (std::string_view(cx.cdefsrc) == "-") /* the descriptor itself: it may be no file, or half read */
+            take_source(cx, cx.cdefsrc, fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
+        else
+            open_source(cx, cx.cdefsrc);
         for (;;) {
             source_line source = next_line(cx);
             if (source.begin == nullptr)

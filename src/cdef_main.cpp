@@ -22,9 +22,27 @@ bool tolerable(const cdb::finding &finding) {
            finding.broken->code == cdb::CODE_RESERVED;
 }
 
+/* From the descriptor itself: it may be no file, or half read. */
+std::vector<std::byte> standard_input(std::error_code &error) {
+    constexpr std::size_t STEP = 65536;
+    std::vector<std::byte> contents;
+    for (ssize_t got = 1; got != 0;) {
+        std::size_t size = contents.size();
+        contents.resize(size + STEP);
+        got = read(STDIN_FILENO, contents.data() + size, STEP);
+        bool again = got < 0 && errno == EINTR;
+        if (got < 0 && !again) {
+            error = {errno, std::generic_category()};
+            return {};
+        }
+        contents.resize(size + (again ? 0 : static_cast<std::size_t>(got)));
+    }
+    return contents;
+}
+
 std::vector<std::byte> contents_of(const std::string &path) {
     std::error_code error;
-    std::vector<std::byte> contents = cdb::read_file(path == "-" ? "/dev/stdin" : path.c_str(), error);
+    std::vector<std::byte> contents = path == "-" ? standard_input(error) : cdb::read_file(path.c_str(), error);
     if (error)
         throw trouble(path + ": " + error.message());
     return contents;
@@ -33,6 +51,10 @@ std::vector<std::byte> contents_of(const std::string &path) {
 } // namespace
 
 input::input(const std::string &path) : name(path), contents(contents_of(path)), db(contents) {}
+
+void tell(const std::exception &trouble) {
+    std::fprintf(stderr, "cdef: %s\n", trouble.what());
+}
 
 void require_readable(const input &in) {
     std::vector<cdb::finding> findings = cdb::verify(in.db);
@@ -96,7 +118,7 @@ int main(int argc, char **argv) {
     try {
         return cdef::run(argc, argv);
     } catch (const std::exception &trouble) {
-        std::fprintf(stderr, "cdef: %s\n", trouble.what());
+        cdef::tell(trouble);
     } catch (...) {
         std::fputs("cdef: out of memory\n", stderr);
     }

@@ -1,0 +1,108 @@
+"""Test how `cdef check` is used: many sources, ones that cannot be read, standard
+input of all kinds, and its exit statuses.  What it says of a source, the cases
+of cdef_check_test.py test.
+"""
+
+import argparse
+import json
+import os
+import pathlib
+import socket
+import subprocess
+import sys
+import tempfile
+import unittest
+
+OPTIONS = argparse.Namespace()
+CASES = pathlib.Path(__file__).resolve().parent / "cdef/check"
+
+WRONG = "data-type.cdefsrc"
+ODD = "permission.cdefsrc"
+RIGHT = "sound.cdefsrc"
+MISSING = "cdef: missing: cannot open because: No such file or directory\n"
+DIRECTORY = "cdef: .: cannot read because: Is a directory\n"
+
+
+def check(*operands, stdin=subprocess.DEVNULL):
+    """Status, output and messages of `cdef check`, run among the cases."""
+    result = subprocess.run(
+        [OPTIONS.cdef, "check", *operands], cwd=CASES, stdin=stdin, capture_output=True, check=False, timeout=60)
+    return result.returncode, result.stdout.decode(), result.stderr.decode()
+
+
+def expected(source, shown=None):
+    """What is said of a case's source, under its own or another name."""
+    text = (CASES / source).with_suffix(".expect").read_text().partition("---\n")[2]
+    return text.replace(f"{source}:", f"{shown or source}:")
+
+
+class Sources(unittest.TestCase):
+    """One or many, and which of them cannot be read."""
+
+    def test_the_worst_decides(self):
+        self.assertEqual(check(RIGHT, ODD), (0, "", expected(ODD)))
+        self.assertEqual(check(ODD, WRONG, RIGHT), (1, "", expected(ODD) + expected(WRONG)))
+        self.assertEqual(check("--werror", RIGHT, ODD), (1, "", expected(ODD)))
+
+    def test_missing(self):
+        self.assertEqual(check("missing"), (2, "", MISSING))
+
+    def test_directory(self):
+        self.assertEqual(check("."), (2, "", DIRECTORY))
+
+    def test_the_others_are_shown_where_they_stand(self):
+        text = expected(ODD) + MISSING + expected(WRONG) + DIRECTORY
+        self.assertEqual(check(ODD, "missing", WRONG, "."), (2, "", text))
+
+    def test_the_others_are_shown_to_programs(self):
+        status, text, messages = check("--format", "json", WRONG, "missing", RIGHT)
+        self.assertEqual((status, messages), (2, MISSING))
+        self.assertEqual([(each["file"], each["errors"] > 0) for each in json.loads(text)], [(WRONG, True), (RIGHT, False)])
+        status, text, messages = check("--format", "sarif", "missing", WRONG)
+        self.assertEqual((status, messages), (2, MISSING))
+        self.assertTrue(json.loads(text)["runs"][0]["results"])
+
+    def test_wrong_usage(self):
+        for operands in ((), ("--nothing", RIGHT), ("--format", "xml", RIGHT), ("--warn", "nothing", RIGHT)):
+            status, text, messages = check(*operands)
+            self.assertEqual((status, text), (2, ""))
+            self.assertTrue(messages.startswith("cdef: "), messages)
+
+
+class StandardInput(unittest.TestCase):
+    """Whatever it is, it is read from where it stands."""
+
+    def test_file(self):
+        with open(CASES / WRONG, "rb") as file:
+            self.assertEqual(check("-", stdin=file), (1, "", expected(WRONG, "-")))
+
+    def test_file_that_has_been_read_in_part(self):
+        with tempfile.TemporaryFile() as file:
+            file.write(b"Nonsense\n" + (CASES / WRONG).read_bytes())
+            file.flush()
+            os.lseek(file.fileno(), len(b"Nonsense\n"), os.SEEK_SET)
+            self.assertEqual(check("-", stdin=file), (1, "", expected(WRONG, "-")))
+
+    def test_socket(self):
+        ours, theirs = socket.socketpair()
+        with ours, theirs:
+            ours.sendall((CASES / WRONG).read_bytes())
+            ours.shutdown(socket.SHUT_WR)
+            self.assertEqual(check("-", stdin=theirs), (1, "", expected(WRONG, "-")))
+
+    def test_directory(self):
+        directory = os.open(CASES, os.O_RDONLY)
+        self.addCleanup(os.close, directory)
+        self.assertEqual(check("-", stdin=directory), (2, "", DIRECTORY.replace(".:", "-:")))
+
+
+def main():
+    """Run the tests."""
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--cdef", required=True, type=lambda text: pathlib.Path(text).resolve())
+    parser.parse_args(namespace=OPTIONS)
+    unittest.main(argv=[sys.argv[0]])
+
+
+if __name__ == "__main__":
+    main()

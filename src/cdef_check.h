@@ -121,7 +121,12 @@ name_list attribute_names(const srtable_ctrl &kind);
 /* The stanza kinds that have an attribute of this name, as bits. */
 vx_uint32_t kinds_with(std::string_view name);
 
-name_list data_type_names();
+/* The data types that an attribute, or an element, can be of. */
+name_list data_type_names(bool element);
+
+/* As suggestion() says it; but what is near a type that is refused is told so. */
+std::string type_suggestion(std::string_view text, bool element);
+
 name_list variable_type_names();
 name_list property_names(int attr_type);
 

@@ -34,6 +34,11 @@ size_t distance(std::string_view a, std::string_view b) {
 
 constexpr size_t LONGEST_NAME = 64; /* beyond it nothing is like a name */
 
+/* Types that have a name and are taken nowhere, or in no element. */
+bool is_refused(std::string_view type, bool element) {
+    return type == "SBS" || (element && (type == "SD" || type == "SDArray"));
+}
+
 template <class Properties> name_list names_of(const Properties &properties) {
     name_list names;
     for (const props_t &property : properties)
@@ -89,8 +94,19 @@ vx_uint32_t kinds_with(std::string_view name) {
     return kinds;
 }
 
-name_list data_type_names() {
-    return {std::begin(vxTypeStr) + 1, std::end(vxTypeStr)}; /* the first stands for none */
+name_list data_type_names(bool element) {
+    name_list names = {std::begin(vxTypeStr) + 1, std::end(vxTypeStr)}; /* the first stands for none */
+    std::erase_if(names, [&](std::string_view name) { return is_refused(name, element); });
+    return names;
+}
+
+std::string type_suggestion(std::string_view text, bool element) {
+    std::string_view meant = near_miss(text, {std::begin(vxTypeStr) + 1, std::end(vxTypeStr)});
+    if (meant.empty() || !is_refused(meant, element))
+        return suggestion(text, data_type_names(element));
+    if (meant == "SBS")
+        return quoted(meant) + " is not supported";
+    return "an element cannot be of type " + quoted(meant);
 }
 
 name_list variable_type_names() {

@@ -127,7 +127,7 @@ void unknown_property(noting &n) {
 }
 
 void unknown_type(noting &n) {
-    n.add(n.found.at, suggestion(n.marked(), data_type_names()));
+    n.add(n.found.at, type_suggestion(n.marked(), false));
 }
 
 void unknown_variable_type(noting &n) {
@@ -147,8 +147,7 @@ void bad_value(noting &n) {
     if (numeric && check.overflow_line != 0)
         overflowed(n);
     else if (type == VX_UNKNOWN && n.stanza().data_type.at.line != 0)
-        n.add(n.stanza().data_type.at,
-              "unknown data type: " + suggestion(n.stanza().data_type.text, data_type_names()));
+        n.add(n.stanza().data_type.at, "unknown data type: " + type_suggestion(n.stanza().data_type.text, true));
     else if (type == VX_UNKNOWN)
         n.add(n.found.at, "the stanza has no known DataType");
     else
@@ -178,7 +177,7 @@ void bad_default(noting &n) {
         n.show(n.stanza().data_type, "the DataType of this " + quoted(n.table().sc_name));
     else
         for (const mention &odd : n.check.odd_elements)
-            n.show(odd, odd.text == "SBS" ? "the element's DataType" : suggestion(odd.text, data_type_names()));
+            n.show(odd, odd.text == "SBS" ? "the element's DataType" : type_suggestion(odd.text, true));
 }
 
 void no_manager(noting &n) {

@@ -8,8 +8,6 @@
 
 namespace cdef::check {
 
-namespace {
-
 /* A number as the C library reads it. Plain ones are read without it. */
 struct number {
     explicit number(std::string_view given, int base) : text(given) {
@@ -41,6 +39,8 @@ struct number {
     bool overflow = false;
 };
 
+namespace {
+
 /* Low and high of "low,high", with the offset of the second; both are the whole text if there is no comma. */
 struct pair_of_texts {
     explicit pair_of_texts(std::string_view text) : low(text), high(text) {
@@ -62,38 +62,65 @@ struct pair_of_texts {
 
 } // namespace
 
+/* Of a text that is a number in front, or nowhere. */
+void session::watch_rest(const number &n, const place &at) {
+    if (n.read == 0)
+        warn(NUMBER_TEXT, at, "no number: it is read as 0");
+    else if (!n.rest().empty())
+        warn(NUMBER_TEXT, at, "only the number in front counts: it is read as " + std::to_string(n.value));
+}
+
 /* A number16 or number32, or one part of it. */
 void session::watch_number(std::string_view text, size_t offset, int bits) {
     number n(text, 0);
     place at = value_part(offset, text.size());
     long limit = (1L << bits) - 1;
-    if (n.read == 0 || !n.rest().empty())
-        warn(NUMBER_TEXT, at,
-             n.read == 0 ? "no number: it is read as 0"
-                         : "only the number in front counts: it is read as " + std::to_string(n.value));
+    watch_rest(n, at);
     if (n.overflow || n.value < 0 || n.value > limit)
         warn(NARROWED, at,
              "does not fit " + std::to_string(bits) + " bits: it is stored as " + std::to_string(n.value & limit));
     size_t digits = text.find_first_not_of(" \t+-");
     bool octal = digits != std::string_view::npos && digits + 1 < n.read && text[digits] == '0' &&
                  text[digits + 1] >= '0' && text[digits + 1] <= '7';
-    if (octal)
+    if (octal && n.value != number(text, 10).value)
         warn(OCTAL, at, "a leading 0 makes it octal: it is read as " + std::to_string(n.value));
+}
+
+/* A number of an unsigned type, of which only the low bits are stored, and what is below 0 as its complement. */
+void session::watch_unsigned(std::string_view text, size_t offset, vx_data_type_t type) {
+    constexpr size_t SAFE_DIGITS = 9;
+    bool plain = text.size() <= SAFE_DIGITS && text.find_first_not_of("0123456789") == std::string_view::npos;
+    if (plain)
+        return;
+    vx_uint64_t value = std::strtoull(std::string(text).c_str(), nullptr, 10);
+    vx_uint64_t stored = type == VX_UINT32 ? static_cast<vx_uint32_t>(value) : value;
+    bool negative = text.find('-') != std::string_view::npos && value != 0;
+    if (negative || stored != value)
+        warn(NARROWED, value_part(offset, text.size()),
+             std::string("does not fit ") + (type == VX_UINT32 ? "UInt32" : "UInt64") + ": it is stored as " +
+                 std::to_string(stored));
 }
 
 /* A value of the attribute's own type, or one part of it. */
 void session::watch_typed(std::string_view text, size_t offset) {
     vx_data_type_t type = scalar_vx(data_type(cx));
-    place at = value_part(offset, text.size());
-    if (type != VX_INT32 && type != VX_UINT32 && type != VX_UINT64)
+    if (type == VX_UINT32 || type == VX_UINT64)
+        return watch_unsigned(text, offset, type);
+    if (type != VX_INT32)
         return;
     number n(text, 10);
-    if (type == VX_INT32 && (n.overflow || n.value != static_cast<vx_int32_t>(n.value)))
-        warn(NARROWED, at, "does not fit Int32: it is stored as " + std::to_string(static_cast<vx_int32_t>(n.value)));
-    if (type == VX_UINT32 && (n.overflow || n.value != static_cast<long>(static_cast<vx_uint32_t>(n.value))))
-        warn(NARROWED, at, "does not fit UInt32: it is stored as " + std::to_string(static_cast<vx_uint32_t>(n.value)));
-    if (type == VX_UINT64 && n.value < 0)
-        warn(NARROWED, at, "does not fit UInt64: it is stored as " + std::to_string(static_cast<vx_uint64_t>(n.value)));
+    auto stored = static_cast<vx_int32_t>(n.value);
+    if (n.overflow || n.value != stored)
+        warn(NARROWED, value_part(offset, text.size()),
+             "does not fit Int32: it is stored as " + std::to_string(stored));
+}
+
+/* The highest index of an attribute has 16 bits; told where they are passed. */
+void session::watch_index(std::string_view text) {
+    constexpr int TOO_HIGH = 1 << 16;
+    watch_unsigned(text, 0, VX_UINT32);
+    if (cx.curr_sdeli == TOO_HIGH && cx.max_sd_idx != nullptr)
+        warn(NARROWED, value_part(0, text.size()), "does not fit 16 bits, which the attribute's highest index has");
 }
 
 void session::watch_version() {
@@ -103,9 +130,7 @@ void session::watch_version() {
         size_t dot = std::min(text.find('.', offset), text.size());
         std::string_view piece = text.substr(offset, dot - offset);
         number n(piece, 10);
-        if (!n.rest().empty())
-            warn(NUMBER_TEXT, value_part(offset, piece.size()),
-                 "only the number in front counts: it is read as " + std::to_string(n.value));
+        watch_rest(n, value_part(offset, piece.size()));
         if (n.overflow || n.value < 0 || n.value > 255)
             warn(NARROWED, value_part(offset, piece.size()), "a part of a version has 8 bits");
         offset = dot + 1;
@@ -134,6 +159,8 @@ void session::watch_numbers() {
     case AT_ID:
         watch_number(text, 0, 32);
         return watch_id(text);
+    case AT_SD_INDEX:
+        return watch_index(text);
     case AT_VARIETY: {
         pair_of_texts both(text);
         watch_number(both.low, 0, 32);

@@ -257,7 +257,7 @@ void session::unknown_header(const attr_text &text, const fatal_exit &failure) {
             return take_header(again(stripped), false);
     }
     if (rest_of_line) {
-        found.notes.push_back({all_of_line(), "this is the rest of a line of more than 254 characters"});
+        found.notes.push_back({all_of_line(), "this is the rest of a line of more than 253 characters"});
         return;
     }
     bool attribute = name.find('=') != std::string_view::npos &&

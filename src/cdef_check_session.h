@@ -77,6 +77,8 @@ private:
     std::vector<slot> slots;
 };
 
+struct number; /* as the C library reads it (cdef_check_numbers.cpp) */
+
 /* Names and numbers of one kind. */
 struct known_values {
     first_lines names;
@@ -92,10 +94,11 @@ struct watch {
     bool variable_class_unnamed = false;   /* and one that has been told to lack its name may be any of them */
     first_lines defined_variable_classes;
     std::optional<mention> locator;
-    std::string sd_source; /* the line of */
-    place sd_attribute;    /* the header of the latest SD-typed attribute whose run may still come, or goes on; */
-    bool sd_run = false;   /* and that it goes on */
-    int piece = 0;         /* the line that filled a whole piece, if the one before did */
+    std::string sd_source;   /* the line of */
+    place sd_attribute;      /* the header of the latest SD-typed attribute whose run may still come, or goes on; */
+    bool sd_run = false;     /* and that it goes on */
+    int piece = 0;           /* the line that filled a whole piece, if the one before did, */
+    bool piece_told = false; /* and that it belongs to a line that has been told of */
     bool carriage_returns = false;
 };
 
@@ -160,6 +163,7 @@ struct session {
 
     /* Warnings (cdef_check_warn.cpp, cdef_check_numbers.cpp). */
     void watch_line(const source_line &line);
+    void watch_returns();
     void watch_header(int kind);
     void watch_stanza_end(int next_kind);
     void watch_complete();
@@ -167,6 +171,9 @@ struct session {
     void note_type(std::string_view text);
     void watch_number(std::string_view text, size_t offset, int bits);
     void watch_numbers();
+    void watch_rest(const number &n, const place &at);
+    void watch_unsigned(std::string_view text, size_t offset, vx_data_type_t type);
+    void watch_index(std::string_view text);
     void watch_typed(std::string_view text, size_t offset);
     void watch_bounds();
     void watch_valid(std::string_view text);

@@ -8,22 +8,55 @@ namespace cdef::check {
 
 namespace {
 
-/* Nothing of a source may command a terminal. */
-std::string visible(std::string_view text) {
-    std::string shown(text);
-    for (char &c : shown)
-        if (c != '\t' && (static_cast<unsigned char>(c) < ' ' || c == '\x7F'))
-            c = '?';
-    return shown;
+/* The bytes of the character that a text begins with: those of well-formed UTF-8, or else 1. */
+size_t length_of(std::string_view text) {
+    auto lead = static_cast<unsigned char>(text[0]);
+    size_t length = lead < 0xC2 ? 1 : lead < 0xE0 ? 2 : lead < 0xF0 ? 3 : lead < 0xF5 ? 4 : 1;
+    if (length > text.size())
+        return 1;
+    for (size_t i = 1; i < length; ++i)
+        if ((static_cast<unsigned char>(text[i]) & 0xC0) != 0x80)
+            return 1;
+    return length;
 }
 
-bool begins_character(char c) {
-    return (static_cast<unsigned char>(c) & 0xC0) != 0x80;
+unsigned code_point(std::string_view character) {
+    unsigned code = static_cast<unsigned char>(character[0]);
+    if (character.size() > 1)
+        code &= 0x7Fu >> character.size();
+    for (char c : character.substr(1))
+        code = code << 6 | (static_cast<unsigned char>(c) & 0x3Fu);
+    return code;
+}
+
+/* Control characters, those that are no ASCII too; what turns the direction of writing; and bytes that are no UTF-8,
+ * which a terminal may take for either. */
+bool is_unsafe(std::string_view character) {
+    unsigned code = code_point(character);
+    if (character.size() == 1)
+        return code != '\t' && (code < ' ' || code >= 0x7F);
+    bool control = code < 0xA0 || code == 0x2028 || code == 0x2029;
+    bool turns = code == 0x061C || code == 0x200E || code == 0x200F || (code >= 0x202A && code <= 0x202E) ||
+                 (code >= 0x2066 && code <= 0x2069);
+    return control || turns;
+}
+
+/* Nothing of a source, or of its name, may command a terminal. A '?' stands for each such character. */
+std::string visible(std::string_view text) {
+    std::string shown;
+    for (size_t length = 0; !text.empty(); text.remove_prefix(length)) {
+        length = length_of(text);
+        if (is_unsafe(text.substr(0, length)))
+            shown += '?';
+        else
+            shown += text.substr(0, length);
+    }
+    return shown;
 }
 
 /* "file:line:column: ", as much of it as there is. */
 std::string prefix(const std::string &file, const place &at) {
-    std::string text = file + ":";
+    std::string text = visible(file) + ":";
     if (at.line != 0)
         text += std::to_string(at.line) + ":";
     if (at.line != 0 && at.column != 0)
@@ -35,11 +68,12 @@ std::string prefix(const std::string &file, const place &at) {
 std::string carets(std::string_view source, const place &at) {
     std::string text;
     size_t begin = std::min(at.column - 1, source.size());
-    for (char c : source.substr(0, begin))
-        if (begins_character(c))
-            text += c == '\t' ? '\t' : ' ';
-    std::string_view marked = source.substr(begin, at.length);
-    auto width = static_cast<size_t>(std::count_if(marked.begin(), marked.end(), begins_character));
+    for (size_t i = 0; i < begin; i += length_of(source.substr(i)))
+        text += source[i] == '\t' ? '\t' : ' ';
+    size_t end = begin + std::min(at.length, source.size() - begin);
+    size_t width = 0;
+    for (size_t i = begin; i < end; i += length_of(source.substr(i)))
+        ++width;
     return text + "^" + std::string(width > 1 ? width - 1 : 0, '~');
 }
 

@@ -8,7 +8,7 @@ namespace cdef::check {
 
 namespace {
 
-constexpr size_t PIECE = 254; /* characters of a line that one read takes */
+constexpr size_t PIECE = 254; /* characters of a line that one read takes, the newline included */
 
 bool is_attribute_kind(int kind) {
     return kind >= 0 && sc_tables[index_of(kind)].sc_attr != nullptr;
@@ -32,17 +32,24 @@ std::string_view session::value_text() const {
 
 void session::watch_line(const source_line &source) {
     bool whole_piece = source.begin == cx.inbuf && raw.size() == PIECE;
-    if (seen.piece != 0)
+    rest_of_line = seen.piece != 0;
+    if (rest_of_line && !seen.piece_told)
         warn_at(
             LONG_LINE, {seen.piece, 0, 0}, {},
-            "line of more than 254 characters: the rest is read as a line of its own, and later lines count one more");
-    rest_of_line = seen.piece != 0;
+            "line of more than 253 characters: the rest is read as a line of its own, and later lines count one more");
+    seen.piece_told = rest_of_line;
     seen.piece = whole_piece ? cx.linenum : 0;
-    if (raw.ends_with('\r') && !seen.carriage_returns) {
-        seen.carriage_returns = true;
-        warn(CARRIAGE_RETURN, {cx.linenum, raw.size(), 1},
-             "carriage return at the end of a line, which belongs to the line's text");
-    }
+    if (!seen.carriage_returns)
+        watch_returns();
+}
+
+void session::watch_returns() {
+    size_t at = raw.find('\r');
+    if (at == std::string::npos)
+        return;
+    seen.carriage_returns = true;
+    const char *where = at + 1 == raw.size() ? "carriage return at the end of a line" : "carriage return within a line";
+    warn(CARRIAGE_RETURN, {cx.linenum, at + 1, 1}, std::string(where) + ", which belongs to the line's text");
 }
 
 /* ---- Stanzas -------------------------------------------------------------------------------------------------- */
@@ -174,8 +181,7 @@ void session::watch_attribute() {
         if (cx.attr_dflt_val != nullptr && (unknown || text == "SBS"))
             odd_elements.push_back({at, std::string(text), raw});
         else if (unknown)
-            warn(ELEMENT_TYPE, at, "unknown data type: the element gets none",
-                 {{at, suggestion(text, data_type_names())}});
+            warn(ELEMENT_TYPE, at, "unknown data type: the element gets none", {{at, type_suggestion(text, true)}});
         return;
     }
     default:

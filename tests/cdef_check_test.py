@@ -99,6 +99,9 @@ def check_tables(root):
             problems.append(f"docs/messages.md: {code} is in no table")
     codes = [row[0] for row in errors + warnings]
     problems += [f"{code} is given twice" for code in set(codes) if codes.count(code) > 1]
+    example = (root / "tests/cdef/check/disk.expect").read_text().partition("---\n")[2]
+    if f"```\n{example}```\n" not in (root / "README.md").read_text():
+        problems.append("README.md: the example is not what tests/cdef/check/disk.expect says")
     known = {text for _, text in errors}
     problems += [f"no code for {text!r}" for text in sorted(raised(root) - known)]
     problems += [f"nothing in src raises {text!r}" for text in sorted(known - raised(root))]

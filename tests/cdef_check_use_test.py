@@ -69,6 +69,21 @@ class Sources(unittest.TestCase):
             self.assertTrue(messages.startswith("cdef: "), messages)
 
 
+class ManyElements(unittest.TestCase):
+    """More of them than the attribute's highest index can count."""
+
+    def test_told_once(self):
+        head, _, tail = (CASES / "index-narrowed.cdefsrc").read_text().partition("PAttrSDDefinition\n")
+        tail = tail[tail.index("ClassToManagerMapping"):]
+        element = "PAttrSDDefinition\n\tElementName={0}\n\tDescription=1\n\tDisplayName=1\n\tElementIndex={0}\n\tDataType=None\n"
+        with tempfile.NamedTemporaryFile("w", suffix=".cdefsrc") as source:
+            source.write(head + "".join(element.format(index) for index in range(65538)) + tail)
+            source.flush()
+            status, text, _ = check("--format", "json", source.name)
+        (only,) = json.loads(text)[0]["findings"]
+        self.assertEqual((status, only["code"], only["source"]), (0, "S508", "\tElementIndex=65536"))
+
+
 class StandardInput(unittest.TestCase):
     """Whatever it is, it is read from where it stands."""
 

@@ -112,7 +112,7 @@ using name_list = std::vector<std::string_view>;
 /* The only one of the names that the text may have been meant to be; empty if there is none or there are several. */
 std::string_view near_miss(std::string_view text, const name_list &names);
 
-/* "did you mean `Name`?", or else "one of Name, Id". */
+/* "did you mean `Name`?", or else "known are `Name` and `Id`", unless they are too many. */
 std::string suggestion(std::string_view text, const name_list &names);
 
 name_list stanza_names();

@@ -186,6 +186,7 @@ struct session {
     void watch_range();
     void watch_quotes();
     void ranges_settled(bool resource_was_open, bool class_was_open, int kind);
+    void watch_variable_classes();
     void watch_end();
 
     const warning_set &wanted;

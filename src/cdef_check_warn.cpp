@@ -262,6 +262,19 @@ void session::watch_quotes() {
 
 /* ---- The end of the source ------------------------------------------------------------------------------------ */
 
+void session::watch_variable_classes() {
+    constexpr size_t SEARCHED_MAX = 1'000'000; /* names that are compared, for the work not to be quadratic */
+    name_list defined = seen.defined_variable_classes.all();
+    size_t searched = 0;
+    for (const mention &named : seen.variable_classes) {
+        if (seen.defined_variable_classes.has(named.text))
+            continue;
+        bool search = (searched += defined.size()) <= SEARCHED_MAX;
+        warn_at(UNKNOWN_VARIABLE_CLASS, named.at, named.source, "no `ResourceVariableClass` has this name",
+                {{named.at, search ? suggestion(named.text, defined) : std::string()}});
+    }
+}
+
 /* What names something is looked at only if everything that could be named has been read. */
 void session::watch_end() {
     if (out.errors > 0)
@@ -271,10 +284,8 @@ void session::watch_end() {
         warn_at(UNKNOWN_LOCATOR, seen.locator->at, seen.locator->source,
                 "no `PersistentResourceAttribute` has this name",
                 {{seen.locator->at, suggestion(seen.locator->text, attributes.all())}});
-    for (const mention &named : seen.variable_classes)
-        if (!seen.variable_class_unnamed && !seen.defined_variable_classes.has(named.text))
-            warn_at(UNKNOWN_VARIABLE_CLASS, named.at, named.source, "no `ResourceVariableClass` has this name",
-                    {{named.at, suggestion(named.text, seen.defined_variable_classes.all())}});
+    if (!seen.variable_class_unnamed)
+        watch_variable_classes();
     for (finding &found : out.findings)
         std::erase_if(found.notes, [](const note &each) { return each.text.empty(); });
 }

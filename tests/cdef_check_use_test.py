@@ -84,6 +84,29 @@ class ManyElements(unittest.TestCase):
         self.assertEqual((status, only["code"], only["source"]), (0, "S508", "\tElementIndex=65536"))
 
 
+class ManyNames(unittest.TestCase):
+    """What is searched for names that are like one is bounded, or the work would be quadratic."""
+
+    def test_searches_end(self):
+        head, _, tail = (CASES / "variable-class-once.cdefsrc").read_text().partition("ResourceVariableClass\n")
+        classes = "ResourceVariableClass\n\tVariableClass=Class{}\n\tObservationInterval=1\n\tReportingInterval=1\n"
+        attribute = tail[tail.index("DynamicResourceAttribute"):].partition("DynamicResourceAttribute\n")[2]
+        attribute = "DynamicResourceAttribute\n" + attribute.partition("DynamicResourceAttribute\n")[0]
+        tail = tail[tail.index("ClassToManagerMapping"):]
+        body = "".join(classes.format(10000 + number) for number in range(1000))
+        for number in range(1200):
+            name = f"Clas{10000 + number}" if number < 1000 else f"Other{number}"
+            body += attribute.replace("Vv", name).replace("Name=A", f"Name={number}").replace("Id=0", f"Id={number}")
+        with tempfile.NamedTemporaryFile("w", suffix=".cdefsrc") as source:
+            source.write(head + body + tail)
+            source.flush()
+            status, text, _ = check("--format", "json", "--no-warn", "narrowed", source.name)
+        findings = json.loads(text)[0]["findings"]
+        self.assertEqual((status, len(findings), {each["code"] for each in findings}), (0, 1200, {"S505"}))
+        self.assertEqual(findings[999]["notes"][0]["message"], "did you mean `Class10999`?")
+        self.assertEqual([each["notes"] for each in findings[1000:]], [[]] * 200)
+
+
 class StandardInput(unittest.TestCase):
     """Whatever it is, it is read from where it stands."""
 

@@ -89,7 +89,8 @@ void session::watch_number(std::string_view text, size_t offset, int bits) {
 /* A number of an unsigned type, of which only the low bits are stored, and what is below 0 as its complement. */
 void session::watch_unsigned(std::string_view text, size_t offset, vx_data_type_t type) {
     constexpr size_t SAFE_DIGITS = 9;
-    bool plain = text.size() <= SAFE_DIGITS && text.find_first_not_of("0123456789") == std::string_view::npos;
+    bool plain = text.size() <= SAFE_DIGITS &&
+                 std::all_of(text.begin(), text.end(), [](char c) { return c >= '0' && c <= '9'; });
     if (plain)
         return;
     vx_uint64_t value = std::strtoull(std::string(text).c_str(), nullptr, 10);

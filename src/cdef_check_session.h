@@ -100,6 +100,7 @@ struct watch {
     int piece = 0;           /* the line that filled a whole piece, if the one before did, */
     bool piece_told = false; /* and that it belongs to a line that has been told of */
     bool carriage_returns = false;
+    const char *next_return = nullptr; /* in the reader's buffer, or behind what it holds; null if not known */
 };
 
 /* A member of the compilation's context, opened, and the text of the current line. */
@@ -163,7 +164,7 @@ struct session {
 
     /* Warnings (cdef_check_warn.cpp, cdef_check_numbers.cpp). */
     void watch_line(const source_line &line);
-    void watch_returns();
+    void watch_returns(const source_line &line);
     void watch_header(int kind);
     void watch_stanza_end(int next_kind);
     void watch_complete();

@@ -3,6 +3,7 @@
 #include "cdef_check_session.h"
 
 #include <algorithm>
+#include <utility>
 
 namespace cdef::check {
 
@@ -40,13 +41,23 @@ void session::watch_line(const source_line &source) {
     seen.piece_told = rest_of_line;
     seen.piece = whole_piece ? cx.linenum : 0;
     if (!seen.carriage_returns)
-        watch_returns();
+        watch_returns(source);
 }
 
-void session::watch_returns() {
-    size_t at = raw.find('\r');
-    if (at == std::string::npos)
+/* Where the next one stands is found once, however many lines stand before it; as the reader's marks are. */
+void session::watch_returns(const source_line &source) {
+    const source_file &file = cx.cdb_fp;
+    bool cut = source.begin == cx.inbuf;
+    bool filled_anew = source.begin == file.buffer.data();
+    if (cut || filled_anew || seen.next_return < source.begin) {
+        const char *end = cut ? source.end : file.buffer.data() + file.end;
+        const void *found = memchr(source.begin, '\r', static_cast<size_t>(end - source.begin));
+        seen.next_return = found == nullptr ? end : static_cast<const char *>(found);
+    }
+    const char *next = cut ? std::exchange(seen.next_return, nullptr) : seen.next_return;
+    if (next >= source.end)
         return;
+    auto at = static_cast<size_t>(next - source.begin);
     seen.carriage_returns = true;
     const char *where = at + 1 == raw.size() ? "carriage return at the end of a line" : "carriage return within a line";
     warn(CARRIAGE_RETURN, {cx.linenum, at + 1, 1}, std::string(where) + ", which belongs to the line's text");

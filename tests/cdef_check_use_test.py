@@ -7,6 +7,8 @@ import argparse
 import json
 import os
 import pathlib
+import re
+import shutil
 import socket
 import subprocess
 import sys
@@ -14,6 +16,7 @@ import tempfile
 import unittest
 
 OPTIONS = argparse.Namespace()
+EDITORS = pathlib.Path(__file__).resolve().parent.parent / "editors"
 CASES = pathlib.Path(__file__).resolve().parent / "cdef/check"
 
 WRONG = "data-type.cdefsrc"
@@ -105,6 +108,49 @@ class ManyNames(unittest.TestCase):
         self.assertEqual((status, len(findings), {each["code"] for each in findings}), (0, 1200, {"S505"}))
         self.assertEqual(findings[999]["notes"][0]["message"], "did you mean `Class10999`?")
         self.assertEqual([each["notes"] for each in findings[1000:]], [[]] * 200)
+
+
+class Editors(unittest.TestCase):
+    """What the files for editors make of messages, with a column and without one."""
+
+    SOURCES = ("keys.cdefsrc", "long-line.cdefsrc", "unknown-attribute.cdefsrc", "numbers.cdefsrc", "repeated.cdefsrc")
+
+    def setUp(self):
+        status, text, self.messages = check("--format", "json", *self.SOURCES)
+        self.assertEqual((status, self.messages), (1, ""))
+        self.findings = [(each["file"], found) for each in json.loads(text) for found in each["findings"]]
+        self.assertIn(None, [found["column"] for _, found in self.findings if found["severity"] == "warning"])
+        _, _, self.messages = check(*self.SOURCES)
+
+    def test_vscode(self):
+        package = json.loads((EDITORS / "vscode/package.json").read_text())
+        (matcher,) = package["contributes"]["problemMatchers"]
+        pattern = matcher["pattern"]
+        matches = [match for line in self.messages.splitlines() if (match := re.match(pattern["regexp"], line))]
+        keys = ("file", "line", "column", "severity")
+        found = [tuple(match[pattern[key]] for key in keys) for match in matches]
+        wanted = [
+            (file, str(each["line"]), each["column"] and str(each["column"]), each["severity"])
+            for file, each in self.findings
+        ]
+        self.assertEqual(found, wanted)
+
+    @unittest.skipUnless(shutil.which("vim"), "there is no vim")
+    def test_vim(self):
+        with tempfile.TemporaryDirectory() as name:
+            directory = pathlib.Path(name)
+            (directory / "messages").write_text(self.messages + "empty.cdefsrc: error: No classes defined [S301]\n")
+            list_all = "map(getqflist(), {_, each -> [bufname(each.bufnr), each.lnum, each.col, each.type, each.valid]})"
+            commands = (f"set rtp^={EDITORS}/vim", "compiler cdef", f"cgetfile {directory}/messages",
+                        f"call writefile([json_encode({list_all})], '{directory}/list')", "qa!")
+            subprocess.run(["vim", "-Nu", "NONE", "-i", "NONE", "-es", *(f"-c{each}" for each in commands)],
+                           stdin=subprocess.DEVNULL, check=True, timeout=60, cwd=CASES)
+            listed = json.loads((directory / "list").read_text())
+        kinds = {"E": "error", "e": "error", "W": "warning", "w": "warning"}
+        found = [(file, line, column, kinds[kind]) for file, line, column, kind, valid in listed if valid and kind in kinds]
+        wanted = [(file, each["line"], each["column"] or 0, each["severity"]) for file, each in self.findings]
+        self.assertEqual(found, wanted + [("empty.cdefsrc", 0, 0, "error")])
+        self.assertEqual(sum(kind in "Nn" and valid for *_, kind, valid in listed), self.messages.count(": note: "))
 
 
 class StandardInput(unittest.TestCase):

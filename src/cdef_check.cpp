@@ -26,14 +26,14 @@ struct check_options {
 std::vector<std::string> warning_names() {
     std::vector<std::string> names = {"all"};
     for (const warning &known : check::warnings)
-        names.emplace_back(known.name);
+        names.insert(names.end(), {known.name, known.code});
     return names;
 }
 
 void switch_warnings(check::warning_set &set, const std::vector<std::string> &names, bool on) {
     for (const std::string &name : names)
         for (const warning &known : check::warnings)
-            if (name == "all" || name == known.name)
+            if (name == "all" || name == known.name || name == known.code)
                 set[known.id] = on;
 }
 

@@ -87,6 +87,10 @@ void no_stanza(noting &n) {
 }
 
 void unknown_name(noting &n) {
+    std::string given = n.marked();
+    if (given.ends_with(' ') || given.ends_with('\t'))
+        if (find_attr(n.table(), std::string_view(given).substr(0, given.find_last_not_of(" \t") + 1)) != nullptr)
+            return n.add(n.found.at, "blanks in front of the = belong to the name");
     vx_uint32_t others = kinds_with(n.marked());
     if (near_miss(n.marked(), attribute_names(n.table())).empty() && std::has_single_bit(others))
         n.add(n.found.at, belongs_to(others));

@@ -8,6 +8,7 @@ namespace cdef::check {
 
 namespace {
 
+constexpr std::string_view BYTE_ORDER_MARK = "\xEF\xBB\xBF";
 constexpr int HEADER_TRIES = SC_COUNT; /* each one closes a record */
 
 bool is_open(cdgen &cx, int kind) {
@@ -241,21 +242,33 @@ void session::indented_header(std::string_view meant, const fatal_exit &failure)
     take_header(again(meant), !exact);
 }
 
+/* Takes a header without what cannot be seen of it. */
+bool session::take_stripped(finding &found, std::string_view name) {
+    size_t length = name.size();
+    if (raw.starts_with(BYTE_ORDER_MARK)) {
+        name.remove_prefix(BYTE_ORDER_MARK.size());
+        found.notes.push_back({all_of_line(), "a byte order mark is in front, which belongs to the name"});
+    }
+    if (raw.ends_with('\r')) {
+        strip_returns = true;
+        name = name.substr(0, name.find_last_not_of('\r') + 1);
+        found.notes.push_back({all_of_line(), "the line ends with a carriage return, which belongs to the name; "
+                                              "further ones are passed over"});
+    }
+    if (name.size() == length || set_table_id(std::string(name).c_str()) < 0)
+        return false;
+    take_header(again(name), false);
+    return true;
+}
+
 /* A header that names no kind: of an attribute line without its blank, a near miss, or lost. */
 void session::unknown_header(const attr_text &text, const fatal_exit &failure) {
     std::string_view name(text.name, static_cast<size_t>(text.end - text.name));
     if (rest_of_line && error_line + 1 == cx.linenum)
         return; /* all of the line has been told of */
     finding &found = error(failure, all_of_line());
-    if (raw.ends_with('\r')) {
-        strip_returns = true;
-        found.notes.push_back({all_of_line(), "the line ends with a carriage return, which belongs to the name; "
-                                              "further ones are passed over"});
-        std::string_view stripped = name.substr(0, name.find_last_not_of('\r') + 1);
-        int meant = set_table_id(std::string(stripped).c_str());
-        if (meant >= 0)
-            return take_header(again(stripped), false);
-    }
+    if (take_stripped(found, name))
+        return;
     if (rest_of_line) {
         found.notes.push_back({all_of_line(), "this is the rest of a line of more than 253 characters"});
         return;

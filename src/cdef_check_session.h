@@ -127,6 +127,7 @@ struct session {
     void recover_value(const fatal_exit &failure, bool follows);
     void tell_instead(warning_id id, int at_line);
     void open_stanza(int kind, bool broken);
+    bool take_stripped(finding &found, std::string_view name);
     void unknown_header(const attr_text &text, const fatal_exit &failure);
     std::string_view header_meant(const attr_text &text, const fatal_exit &failure) const;
     void indented_header(std::string_view meant, const fatal_exit &failure);

@@ -29,16 +29,16 @@ unsigned code_point(std::string_view character) {
     return code;
 }
 
-/* Control characters, those that are no ASCII too; what turns the direction of writing; and bytes that are no UTF-8,
- * which a terminal may take for either. */
+/* Control characters, those that are no ASCII too; what turns the direction of writing or is not seen; and bytes that
+ * are no UTF-8, which a terminal may take for either. */
 bool is_unsafe(std::string_view character) {
     unsigned code = code_point(character);
     if (character.size() == 1)
         return code != '\t' && (code < ' ' || code >= 0x7F);
     bool control = code < 0xA0 || code == 0x2028 || code == 0x2029;
-    bool turns = code == 0x061C || code == 0x200E || code == 0x200F || (code >= 0x202A && code <= 0x202E) ||
-                 (code >= 0x2066 && code <= 0x2069);
-    return control || turns;
+    bool unseen = code == 0x061C || code == 0xFEFF || (code >= 0x200B && code <= 0x200F) ||
+                  (code >= 0x202A && code <= 0x202E) || (code >= 0x2066 && code <= 0x2069);
+    return control || unseen;
 }
 
 /* Nothing of a source, or of its name, may command a terminal. A '?' stands for each such character. */

@@ -73,7 +73,7 @@ int check_all(const check_options &options) {
             else
                 results.push_back(std::move(checked));
         } catch (const trouble &unreadable) {
-            tell(unreadable);
+            tell(trouble(check::visible(unreadable.what())));
             read = false;
         }
     }

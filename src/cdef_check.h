@@ -142,6 +142,9 @@ std::string listed(const name_list &names);
 /* ---- Forms (cdef_check_text.cpp, cdef_check_json.cpp) -------------------------------------------------------------
  */
 
+/* Nothing of a source, or of its name, may command a terminal: a '?' stands for each character that might. */
+std::string visible(std::string_view text);
+
 /* As compilers write it: a line for each finding and note, and the line of the source with a mark. */
 std::string as_text(const result &checked);
 std::string as_json(std::span<const result> checked);

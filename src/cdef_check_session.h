@@ -170,6 +170,8 @@ struct session {
     void watch_stanza_end(int next_kind);
     void watch_complete();
     void watch_attribute();
+    void watch_permission(std::string_view text, const place &at);
+    void watch_element_type(std::string_view text, const place &at);
     void note_type(std::string_view text);
     void watch_number(std::string_view text, size_t offset, int bits);
     void watch_numbers();

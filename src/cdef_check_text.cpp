@@ -41,7 +41,8 @@ bool is_unsafe(std::string_view character) {
     return control || unseen;
 }
 
-/* Nothing of a source, or of its name, may command a terminal. A '?' stands for each such character. */
+} // namespace
+
 std::string visible(std::string_view text) {
     std::string shown;
     for (size_t length = 0; !text.empty(); text.remove_prefix(length)) {
@@ -53,6 +54,8 @@ std::string visible(std::string_view text) {
     }
     return shown;
 }
+
+namespace {
 
 /* "file:line:column: ", as much of it as there is. */
 std::string prefix(const std::string &file, const place &at) {

@@ -146,6 +146,26 @@ void session::note_type(std::string_view text) {
 
 /* ---- Attributes ----------------------------------------------------------------------------------------------- */
 
+void session::watch_permission(std::string_view text, const place &at) {
+    bool known = std::any_of(std::begin(perm_list), std::end(perm_list),
+                             [&](const valid_perms_t &each) { return each.permission == text[0]; });
+    if (!known)
+        warn(PERMISSION, at, "no permission has this letter, so that none is needed",
+             {{at, "the letters are q, l, e, v, d, c, s, o, a and x"}});
+    else if (text.size() > 1)
+        warn(PERMISSION, at, "only the first letter of a Permission counts");
+}
+
+/* Where the element's default is asked for, the compiler may refuse the type at the run's end. */
+void session::watch_element_type(std::string_view text, const place &at) {
+    bool unknown = data_type(cx) == VX_UNKNOWN;
+    note_type(text);
+    if (cx.attr_dflt_val != nullptr && (unknown || text == "SBS"))
+        odd_elements.push_back({at, std::string(text), raw});
+    else if (unknown)
+        warn(ELEMENT_TYPE, at, "unknown data type: the element gets none", {{at, type_suggestion(text, true)}});
+}
+
 void session::watch_attribute() {
     const table_attrs &attr = *cx.latest.attr;
     std::string_view text = value_text();
@@ -168,16 +188,8 @@ void session::watch_attribute() {
             warn(UNUSED_DEFAULT, here(mark_kind::name),
                  "the default of a class attribute is that of its type: this one is never used");
         return;
-    case AT_PERMISSION: {
-        bool known = std::any_of(std::begin(perm_list), std::end(perm_list),
-                                 [&](const valid_perms_t &each) { return each.permission == text[0]; });
-        if (!known)
-            warn(PERMISSION, at, "no permission has this letter, so that none is needed",
-                 {{at, "the letters are q, l, e, v, d, c, s, o, a and x"}});
-        else if (text.size() > 1)
-            warn(PERMISSION, at, "only the first letter of a Permission counts");
-        return;
-    }
+    case AT_PERMISSION:
+        return watch_permission(text, at);
     case AT_DATA_TYPE:
         note_type(text);
         if (scalar_vx(data_type(cx)) == VX_SD_PTR) {
@@ -186,15 +198,8 @@ void session::watch_attribute() {
             seen.sd_run = false;
         }
         return;
-    case AT_SD_DATA_TYPE: {
-        bool unknown = data_type(cx) == VX_UNKNOWN;
-        note_type(text);
-        if (cx.attr_dflt_val != nullptr && (unknown || text == "SBS"))
-            odd_elements.push_back({at, std::string(text), raw});
-        else if (unknown)
-            warn(ELEMENT_TYPE, at, "unknown data type: the element gets none", {{at, type_suggestion(text, true)}});
-        return;
-    }
+    case AT_SD_DATA_TYPE:
+        return watch_element_type(text, at);
     default:
         return;
     }

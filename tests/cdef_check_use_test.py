@@ -53,6 +53,13 @@ class Sources(unittest.TestCase):
     def test_directory(self):
         self.assertEqual(check("."), (2, "", DIRECTORY))
 
+    def test_name_that_commands_a_terminal(self):
+        self.assertEqual(check("\x1b[m\u009b\u202emissing"), (2, "", MISSING.replace("missing", "?[m??missing", 1)))
+        with tempfile.TemporaryDirectory() as directory:
+            source = pathlib.Path(directory) / "\x1b[31m.cdefsrc"
+            source.write_bytes((CASES / WRONG).read_bytes())
+            self.assertEqual(check(source), (1, "", expected(WRONG, f"{directory}/?[31m.cdefsrc")))
+
     def test_the_others_are_shown_where_they_stand(self):
         text = expected(ODD) + MISSING + expected(WRONG) + DIRECTORY
         self.assertEqual(check(ODD, "missing", WRONG, "."), (2, "", text))

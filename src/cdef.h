@@ -23,10 +23,14 @@ constexpr int OK = 0;
 constexpr int FOUND = 1;
 constexpr int TROUBLE = 2;
 
-/* Ends a subcommand; the driver prints "cdef: " and the text, and returns TROUBLE. */
+/* Ends a subcommand; the driver tells it and returns TROUBLE. */
 struct trouble : std::runtime_error {
     using std::runtime_error::runtime_error;
 };
+
+/* Prints "cdef: " and the text to standard error. A subcommand for many files tells of one that it cannot read, goes on
+ * with the others, and returns TROUBLE. */
+void tell(const std::string &trouble);
 
 /* A database read from a file; "-" is standard input. */
 struct input {

@@ -26,14 +26,14 @@ struct check_options {
 std::vector<std::string> warning_names() {
     std::vector<std::string> names = {"all"};
     for (const warning &known : check::warnings)
-        names.emplace_back(known.name);
+        names.insert(names.end(), {known.name, known.code});
     return names;
 }
 
 void switch_warnings(check::warning_set &set, const std::vector<std::string> &names, bool on) {
     for (const std::string &name : names)
         for (const warning &known : check::warnings)
-            if (name == "all" || name == known.name)
+            if (name == "all" || name == known.name || name == known.code)
                 set[known.id] = on;
 }
 
@@ -46,27 +46,39 @@ check::warning_set chosen(const check_options &options) {
     return set;
 }
 
-void show(const std::vector<check::result> &results, const std::string &format) {
-    if (format == "json")
-        return print(check::as_json(results));
-    if (format == "sarif")
-        return print(check::as_sarif(results));
-    for (const check::result &each : results) {
-        std::string text = check::as_text(each);
-        if (std::fwrite(text.data(), 1, text.size(), stderr) != text.size())
-            throw trouble("standard error: cannot write");
-    }
+void show_text(const check::result &checked) {
+    std::string text = check::as_text(checked);
+    if (std::fwrite(text.data(), 1, text.size(), stderr) != text.size())
+        throw trouble("standard error: cannot write");
 }
 
+void show(const std::vector<check::result> &results, const std::string &format) {
+    if (format == "json")
+        print(check::as_json(results));
+    if (format == "sarif")
+        print(check::as_sarif(results));
+}
+
+/* All sources but those that cannot be read, of which is told at once; so is of findings in text form. */
 int check_all(const check_options &options) {
     std::vector<check::result> results;
     bool pass = true;
+    bool read = true;
     for (const std::string &source : options.sources) {
-        results.push_back(check::check_source(source, chosen(options)));
-        pass = pass && results.back().errors == 0 && (results.back().warnings == 0 || !options.warnings_count);
+        try {
+            check::result checked = check::check_source(source, chosen(options));
+            pass = pass && checked.errors == 0 && (checked.warnings == 0 || !options.warnings_count);
+            if (options.format == "text")
+                show_text(checked);
+            else
+                results.push_back(std::move(checked));
+        } catch (const trouble &unreadable) {
+            tell(unreadable.what());
+            read = false;
+        }
     }
     show(results, options.format);
-    return pass ? OK : FOUND;
+    return !read ? TROUBLE : pass ? OK : FOUND;
 }
 
 } // namespace

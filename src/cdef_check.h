@@ -82,6 +82,7 @@ struct place {
 struct note {
     place at;
     std::string text;
+    std::string source = {}; /* the line, if it is to be shown: the finding itself has no place in it */
 };
 
 struct finding {
@@ -111,12 +112,21 @@ using name_list = std::vector<std::string_view>;
 /* The only one of the names that the text may have been meant to be; empty if there is none or there are several. */
 std::string_view near_miss(std::string_view text, const name_list &names);
 
-/* "did you mean `Name`?", or else "one of Name, Id". */
+/* "did you mean `Name`?", or else "known are `Name` and `Id`", unless they are too many. */
 std::string suggestion(std::string_view text, const name_list &names);
 
 name_list stanza_names();
 name_list attribute_names(const srtable_ctrl &kind);
-name_list data_type_names();
+
+/* The stanza kinds that have an attribute of this name, as bits. */
+vx_uint32_t kinds_with(std::string_view name);
+
+/* The data types that an attribute, or an element, can be of. */
+name_list data_type_names(bool element);
+
+/* As suggestion() says it; but what is near a type that is refused is told so. */
+std::string type_suggestion(std::string_view text, bool element);
+
 name_list variable_type_names();
 name_list property_names(int attr_type);
 
@@ -131,6 +141,9 @@ std::string listed(const name_list &names);
 
 /* ---- Forms (cdef_check_text.cpp, cdef_check_json.cpp) -------------------------------------------------------------
  */
+
+/* Nothing of a source, or of its name, may command a terminal: a '?' stands for each character that might. */
+std::string visible(std::string_view text);
 
 /* As compilers write it: a line for each finding and note, and the line of the source with a mark. */
 std::string as_text(const result &checked);

@@ -99,11 +99,18 @@ json location_of(const std::string &file, const place &at, std::string_view sour
     return {{"physicalLocation", std::move(physical)}};
 }
 
+/* The line that a note stands at, as far as it is known. */
+std::string_view source_of(const note &more, const finding &found) {
+    if (!more.source.empty())
+        return more.source;
+    return more.at.line == found.at.line ? std::string_view(found.source) : std::string_view();
+}
+
 json sarif_of(const std::string &file, const finding &found) {
     json entry = {{"ruleId", found.code}, {"level", level_of(found)}, {"message", {{"text", found.text}}}};
     entry["locations"] = json::array({location_of(file, found.at, found.source)});
     for (const note &more : found.notes) {
-        json related = location_of(file, more.at, more.at.line == found.at.line ? found.source : "");
+        json related = location_of(file, more.at, source_of(more, found));
         related["message"] = {{"text", more.text}};
         entry["relatedLocations"].push_back(std::move(related));
     }

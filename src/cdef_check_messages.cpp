@@ -120,7 +120,7 @@ constinit const std::array<warning, WARNING_COUNT> warnings = {{
     {CUT_SHORT, "S514", "cut-short", "a second class ends an attribute unchecked"},
     {INCOMPLETE, "S515", "incomplete", "a stanza lacks required attributes"},
     {LONG_LINE, "S516", "long-line", "a line is read in pieces"},
-    {CARRIAGE_RETURN, "S517", "carriage-return", "a line ends with a carriage return"},
+    {CARRIAGE_RETURN, "S517", "carriage-return", "a line has a carriage return"},
     {STRAY_RUN, "S518", "stray-run", "an action's elements have no action"},
     {LOW_ABOVE_HIGH, "S519", "low-above-high", "the lower bound is above the upper one"},
     {TEXT_AFTER_QUOTE, "S520", "text-after-quote", "text follows the quote that seems to end a value"},

@@ -3,6 +3,9 @@
 
 #include "cdef_check_session.h"
 
+#include <bit>
+#include <cstdlib>
+
 namespace cdef::check {
 
 namespace {
@@ -34,19 +37,6 @@ const char *form_of(vx_data_type_t type) {
     }
 }
 
-vx_data_type_t data_type(cdgen &cx) {
-    vx_data_type_t type = VX_UNKNOWN;
-    if (cx.scp->dt_offset >= 0)
-        memcpy(&type, static_cast<char *>(cx.scp->sc_cb(cx)) + cx.scp->dt_offset, sizeof type);
-    return type;
-}
-
-int line_of(const session &check, int kind, const char *attribute) {
-    const srtable_ctrl &table = sc_tables[index_of(kind)];
-    const table_attrs *attr = find_attr(table, attribute);
-    return check.stanzas[index_of(kind)].given[static_cast<size_t>(attr - table.sc_attrs.data())];
-}
-
 /* One error while its notes are added. */
 struct noting {
     session &check;
@@ -57,6 +47,13 @@ struct noting {
     void add(const place &at, std::string text) {
         if (!text.empty())
             found.notes.push_back({at, std::move(text)});
+    }
+    /* For an error without a place of its own: the line is shown. */
+    void show(const mention &shown, std::string text) {
+        found.notes.push_back({shown.at, std::move(text), shown.source});
+    }
+    mention header() const {
+        return {stanza().header, {}, stanza().source};
     }
     void first_given(int line) {
         if (line != 0)
@@ -76,8 +73,29 @@ struct noting {
     }
 };
 
+/* The only kind that has the attribute. */
+std::string belongs_to(vx_uint32_t kinds) {
+    const char *name = sc_tables[static_cast<size_t>(std::countr_zero(kinds))].sc_name;
+    return "it is an attribute of " + quoted(name) + ", whose header may be missing";
+}
+
+void no_stanza(noting &n) {
+    std::string text = n.marked();
+    vx_uint32_t kinds = kinds_with(std::string_view(text).substr(0, text.find('=')));
+    if (std::has_single_bit(kinds))
+        n.add(n.found.at, belongs_to(kinds));
+}
+
 void unknown_name(noting &n) {
-    n.add(n.found.at, suggestion(n.marked(), attribute_names(n.table())));
+    std::string given = n.marked();
+    if (given.ends_with(' ') || given.ends_with('\t'))
+        if (find_attr(n.table(), std::string_view(given).substr(0, given.find_last_not_of(" \t") + 1)) != nullptr)
+            return n.add(n.found.at, "blanks in front of the = belong to the name");
+    vx_uint32_t others = kinds_with(n.marked());
+    if (near_miss(n.marked(), attribute_names(n.table())).empty() && std::has_single_bit(others))
+        n.add(n.found.at, belongs_to(others));
+    else
+        n.add(n.found.at, suggestion(n.marked(), attribute_names(n.table())));
 }
 
 void too_early(noting &n) {
@@ -97,7 +115,7 @@ void no_sd_attribute(noting &n) {
 }
 
 void incomplete(noting &n) {
-    n.add(n.stanza().header, "this " + quoted(n.table().sc_name) + " lacks " + listed(n.missing()));
+    n.show(n.header(), "this " + quoted(n.table().sc_name) + " lacks " + listed(n.missing()));
 }
 
 void no_class(noting &n) {
@@ -113,11 +131,17 @@ void unknown_property(noting &n) {
 }
 
 void unknown_type(noting &n) {
-    n.add(n.found.at, suggestion(n.marked(), data_type_names()));
+    n.add(n.found.at, type_suggestion(n.marked(), false));
 }
 
 void unknown_variable_type(noting &n) {
     n.add(n.found.at, suggestion(n.marked(), variable_type_names()));
+}
+
+void overflowed(noting &n) {
+    n.add({n.check.overflow_line, 0, 0},
+          "the number that overflows here makes later ones that are 0, or the limit of their type, invalid");
+    n.check.overflow_told = true;
 }
 
 void bad_value(noting &n) {
@@ -125,8 +149,9 @@ void bad_value(noting &n) {
     vx_data_type_t type = data_type(check.cx);
     bool numeric = scalar_vx(type) >= VX_INT32 && scalar_vx(type) <= VX_FLOAT64;
     if (numeric && check.overflow_line != 0)
-        n.add({check.overflow_line, 0, 0}, "the number that overflows here makes later ones that are 0, or the limit "
-                                           "of their type, invalid");
+        overflowed(n);
+    else if (type == VX_UNKNOWN && n.stanza().data_type.at.line != 0)
+        n.add(n.stanza().data_type.at, "unknown data type: " + type_suggestion(n.stanza().data_type.text, true));
     else if (type == VX_UNKNOWN)
         n.add(n.found.at, "the stanza has no known DataType");
     else
@@ -134,7 +159,15 @@ void bad_value(noting &n) {
 }
 
 void wrong_index(noting &n) {
-    n.add(n.found.at, "expected is " + std::to_string(n.check.cx.expected_sdeli));
+    session &check = n.check;
+    int expected = check.cx.expected_sdeli;
+    bool as_expected = std::strtol(n.marked().c_str(), nullptr, 10) == expected;
+    if (check.overflow_line != 0 && as_expected)
+        overflowed(n);
+    else
+        n.add(n.found.at, "expected is " + std::to_string(expected));
+    if (check.index_missing != 0)
+        n.add({check.index_missing, 0, 0}, "this " + quoted(n.table().sc_name) + " lacks `ElementIndex`");
 }
 
 void second_manager(noting &n) {
@@ -145,21 +178,24 @@ void bad_default(noting &n) {
     if (n.kind < 0)
         return;
     if (!is_sd_kind(n.kind))
-        n.add(n.stanza().data_type, "the DataType of this " + quoted(n.table().sc_name));
+        n.show(n.stanza().data_type, "the DataType of this " + quoted(n.table().sc_name));
     else
         for (const mention &odd : n.check.odd_elements)
-            n.add(odd.at, odd.text == "SBS" ? "the element's DataType" : suggestion(odd.text, data_type_names()));
+            n.show(odd, odd.text == "SBS" ? "the element's DataType" : type_suggestion(odd.text, true));
 }
 
 void no_manager(noting &n) {
-    if (n.check.map_line != 0)
-        n.add({n.check.map_line, 0, 0}, "this `ClassToManagerMapping` lacks `ResourceManager`");
+    n.kind = SC_CLASS_TO_MANAGER_MAPPING;
+    n.show(n.header(), "this `ClassToManagerMapping` lacks `ResourceManager`");
 }
 
 void keys(noting &n) {
+    n.kind = SC_CLASS_TO_MANAGER_MAPPING;
     for (const char *key : {"FirstKey", "LastKey"})
-        if (int line = line_of(n.check, SC_CLASS_TO_MANAGER_MAPPING, key))
-            n.add({line, 0, 0}, std::string(key) + " is given here");
+        if (const mention *given = n.check.map_value(key))
+            n.show(*given, given->text + " is given here");
+        else
+            incomplete(n);
 }
 
 struct noting_of {
@@ -168,14 +204,12 @@ struct noting_of {
 };
 
 constexpr noting_of notings[] = {
-    {"S106", unknown_name},     {"S108", too_early},    {"S109", repeated},
-    {"S110", no_sd_attribute},  {"S111", incomplete},   {"S112", no_class},
-    {"S113", no_class},         {"S114", no_class},     {"S115", no_class},
-    {"S116", no_class},         {"S117", no_class},     {"S118", second_map},
-    {"S201", unknown_property}, {"S202", unknown_type}, {"S203", unknown_variable_type},
-    {"S207", bad_value},        {"S210", wrong_index},  {"S213", second_manager},
-    {"S214", bad_default},      {"S215", bad_default},  {"S216", bad_default},
-    {"S303", no_manager},       {"S304", keys},
+    {"S102", no_stanza},       {"S106", unknown_name},     {"S108", too_early},      {"S109", repeated},
+    {"S110", no_sd_attribute}, {"S111", incomplete},       {"S112", no_class},       {"S113", no_class},
+    {"S114", no_class},        {"S115", no_class},         {"S116", no_class},       {"S117", no_class},
+    {"S118", second_map},      {"S201", unknown_property}, {"S202", unknown_type},   {"S203", unknown_variable_type},
+    {"S207", bad_value},       {"S210", wrong_index},      {"S213", second_manager}, {"S214", bad_default},
+    {"S215", bad_default},     {"S216", bad_default},      {"S303", no_manager},     {"S304", keys},
 };
 
 } // namespace

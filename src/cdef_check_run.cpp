@@ -6,13 +6,14 @@
 #include "cdef.h"
 
 #include <algorithm>
+#include <fcntl.h>
 #include <memory>
+#include <unistd.h>
 
 namespace cdef::check {
 
 namespace {
 
-constexpr int HEADER_TRIES = SC_COUNT;           /* each one closes a record */
 constexpr const char *CLASS_NAME = "class.cdef"; /* what a compilation would name it after is not known: a good name */
 
 std::string words_of(const fatal_exit &failure) {
@@ -22,48 +23,12 @@ std::string words_of(const fatal_exit &failure) {
     return text;
 }
 
-bool is_open(cdgen &cx, int kind) {
-    vx_uint32_t identifier = 0;
-    memcpy(&identifier, sc_tables[index_of(kind)].sc_cb(cx), sizeof identifier);
-    return identifier != 0;
-}
-
-void close_record(cdgen &cx, int kind) {
-    constexpr vx_uint32_t none = 0;
-    memcpy(sc_tables[index_of(kind)].sc_cb(cx), &none, sizeof none);
-}
-
-void complete_element(cdgen &cx) {
-    cx.sd_name_found = cx.sd_desc_found = cx.sd_disp_found = cx.sd_dt_found = 1;
-}
-
-/* A run that is given up. */
-void close_run(cdgen &cx) {
-    cx.cb_sd_def.sd_cb_ID = 0;
-    cx.attr_dflt_val = nullptr;
-    cx.curr_sd_tbl = nullptr;
-    cx.max_sd_idx = nullptr;
-    cx.curr_sdeli = -1;
-    cx.expected_sdeli = 0;
-}
-
-constexpr vx_uint32_t bit_of(int attr_type) {
-    return 1u << attr_type;
-}
-
-constexpr vx_uint32_t VALID_VALUES = bit_of(AT_VALID_VALUE) | bit_of(AT_SD_VALID_VALUE);
-constexpr vx_uint32_t TYPED = VALID_VALUES | bit_of(AT_DEFAULT_VALUE) | bit_of(AT_INITIAL_VALUE) | bit_of(AT_RANGE);
-
-bool is_message(const message &known, const char *code) {
-    return std::string_view(known.code) == code;
-}
-
 } // namespace
 
 session::session(const std::string &path, const warning_set &wanted_warnings, result &into)
     : wanted(wanted_warnings), out(into) {
     cx.checking = true;
-    cx.cdefsrc = path == "-" ? "/dev/stdin" : path.c_str();
+    cx.cdefsrc = path.c_str();
     cx.cdefname = CLASS_NAME;
 }
 
@@ -131,295 +96,10 @@ place session::here(mark_kind what, const fatal_exit *failure) const {
     return {cx.linenum, equals + 2, all.column - 1 + all.length - (equals + 1)};
 }
 
-/* Whether an error is no consequence of one that has been told. */
-bool session::may_follow(const fatal_exit &failure) {
-    const message &known = message_of(failure);
-    return out.errors == 0 || known.whose != blame::program;
-}
-
-/* ---- Recovery ------------------------------------------------------------------------------------------------- */
-
-/* A text to be taken as the current line, in the place of the one that the parser has taken apart. */
-attr_text session::again(std::string_view text) {
-    size_t length = std::min(text.size(), copy.size() - 1);
-    memcpy(copy.data(), text.data(), length);
-    copy[length] = '\0';
-    size_t blanks = std::min(std::string_view(copy.data(), length).find_first_not_of(" \t"), length);
-    return {copy.data(), copy.data() + blanks, copy.data() + length};
-}
-
-/* Stanzas before the class, or without any, are checked in a class of their own. */
-void session::forge_class() {
-    if (cx.cb_rsrc_class.rc_cb_ID != 0)
-        return;
-    init_class_tbl(cx);
-    class_forged = true;
-}
-
-/* What has been reported is not completed: its record is dropped before the compiler comes to it. */
-void session::settle_broken(int next_kind) {
-    if (cx.cb_sd_def.sd_cb_ID != 0 && cx.stanzas[index_of(sd_kind)].broken)
-        complete_element(cx);
-    if (next_kind >= 0 && is_sd_kind(next_kind))
-        return;
-    for (int each : {SC_PERSISTENT_RESOURCE_ATTRIBUTE, SC_PERSISTENT_CLASS_ATTRIBUTE, SC_DYNAMIC_RESOURCE_ATTRIBUTE,
-                     SC_DYNAMIC_CLASS_ATTRIBUTE, SC_RESOURCE_ACTION, SC_CLASS_ACTION})
-        if (is_open(cx, each) && cx.stanzas[index_of(each)].broken)
-            close_record(cx, each);
-}
-
-/* A record whose completion failed. */
-void session::abandon(int failed_kind, const fatal_exit &failure) {
-    if (!is_sd_kind(failed_kind))
-        close_record(cx, failed_kind);
-    else if (is_message(message_of(failure), "S111"))
-        complete_element(cx);
-    else
-        close_run(cx);
-}
-
-/* The elements are checked all the same; they belong to nothing. */
-void session::finish_run_by_hand(int new_kind) {
-    forge_class();
-    cx.attr_dflt_val = nullptr;
-    cx.max_sd_idx = nullptr;
-    cx.curr_sd_tbl = &nobody;
-    nobody.offset[0] = mk_sd_sec(cx);
-    cx.scp = cx.curr_sd_scp = &sc_tables[index_of(new_kind)];
-    cx.state = &cx.stanzas[index_of(new_kind)];
-    cx.table_id = new_kind;
-    cx.scp->sc_init_tbl(cx);
-    cx.state->req_mask = cx.state->opt_mask = 0;
-    cx.state->dflt = {};
-}
-
-/* Whether the run's indexes cannot be told any more: an element that has been reported gave none. */
-bool session::lost_index(int new_kind) const {
-    if (new_kind != sd_kind || cx.cb_sd_def.sd_cb_ID == 0)
-        return false;
-    const stanza_state &element = cx.stanzas[index_of(sd_kind)];
-    return kind < 0 || (element.broken && (element.req_mask & ELEMENT_INDEX) == 0);
-}
-
-void session::open_stanza(int new_kind, bool broken) {
-    bool same_run = kind == new_kind && is_sd_kind(new_kind);
-    if (!same_run) { /* after a mistake it may be the rest of a run */
-        index_lost = kind < 0 || cx.stanzas[index_of(kind)].broken;
-        other_index = -1;
-    }
-    kind = new_kind;
-    if (is_sd_kind(kind))
-        sd_kind = kind;
-    skipping = false;
-    cx.stanzas[index_of(kind)].broken = broken;
-    stanza_note &stanza = stanzas[index_of(kind)];
-    stanza.given.fill(0);
-    stanza.failed = 0;
-    stanza.misplaced = false;
-    stanza.data_type = {};
-    stanza.header = all_of_line();
-    stanza.source = raw;
-    if (kind == SC_CLASS_TO_MANAGER_MAPPING)
-        map_line = cx.linenum;
-}
-
-/* Whether the header is to be tried again. */
-bool session::recover_header(const fatal_exit &failure, int new_kind) {
-    const message &known = message_of(failure);
-    if (cx.completing >= 0) {
-        int failed = is_sd_kind(cx.completing) ? sd_kind : cx.completing;
-        if (!cx.stanzas[index_of(failed)].broken && may_follow(failure))
-            add_notes(error(failure, here(mark_kind::none)), failure, failed);
-        splits_stanza = splits_stanza || (failed == kind && out.errors > header_errors);
-        abandon(failed, failure);
-        return true;
-    }
-    if (cx.cb_rsrc_class.rc_cb_ID == 0 && std::string_view(failure.msg).starts_with("No class for")) {
-        if (!header_lost)
-            add_notes(error(failure, all_of_line()), failure, new_kind);
-        header_told = true;
-        forge_class();
-        return true;
-    }
-    bool no_attribute = is_message(known, "S110");
-    bool told = out.errors > header_errors || kind < 0 || cx.stanzas[index_of(kind)].broken;
-    bool consequence = no_attribute && told && out.errors > 0;
-    if (!consequence && may_follow(failure))
-        add_notes(error(failure, all_of_line()), failure, new_kind);
-    if (no_attribute) {
-        finish_run_by_hand(new_kind);
-        open_stanza(new_kind, true);
-        stanzas[index_of(new_kind)].misplaced = true;
-        index_lost = true;
-    } else {
-        skip_stanza();
-    }
-    return false;
-}
-
-/* A header that names no kind: of an attribute line without its blank, a near miss, or lost. */
-void session::unknown_header(const attr_text &text, const fatal_exit &failure) {
-    std::string_view name(text.name, static_cast<size_t>(text.end - text.name));
-    if (rest_of_line && error_line + 1 == cx.linenum)
-        return; /* all of the line has been told of */
-    finding &found = error(failure, all_of_line());
-    if (raw.ends_with('\r')) {
-        strip_returns = true;
-        found.notes.push_back({all_of_line(), "the line ends with a carriage return, which belongs to the name; "
-                                              "further ones are passed over"});
-        std::string_view stripped = name.substr(0, name.find_last_not_of('\r') + 1);
-        int meant = set_table_id(std::string(stripped).c_str());
-        if (meant >= 0)
-            return take_header(again(stripped), false);
-    }
-    if (rest_of_line) {
-        found.notes.push_back({all_of_line(), "this is the rest of a line of more than 254 characters"});
-        return;
-    }
-    bool attribute = name.find('=') != std::string_view::npos &&
-                     set_table_id(std::string(name.substr(0, name.find('='))).c_str()) < 0;
-    if (attribute && kind >= 0) {
-        found.notes.push_back({all_of_line(), "an attribute line begins with a blank or a tab"});
-        std::string indented = std::string("\t").append(name);
-        if (!skipping)
-            take_quietly(indented);
-        return;
-    }
-    std::string_view meant = near_miss(name.substr(0, name.find('=')), stanza_names());
-    found.notes.push_back({all_of_line(), suggestion(name, stanza_names())});
-    if (!meant.empty())
-        return take_header(again(meant), true);
-    watch_stanza_end(-1);
-    if (kind >= 0 && cx.stanzas[index_of(kind)].req_mask != sc_tables[index_of(kind)].req_mask_cmplt)
-        cx.stanzas[index_of(kind)].broken = true; /* the rest of it may be what is skipped */
-    header_lost = true;
-    skip_stanza();
-}
-
-void session::skip_stanza() {
-    skipping = true;
-    kind = -1;
-}
-
-/* The line again, of which an error has been told. */
-void session::take_quietly(std::string_view text) {
-    try {
-        cx.latest = {};
-        take_line(cx, again(text));
-        note_given();
-    } catch (const fatal_exit &) {
-        cx.state->broken = true;
-        stanzas[index_of(kind)].failed |= cx.latest.attr == nullptr ? LOST_NAME : bit_of(cx.latest.attr->ta_type);
-    }
-}
-
-void session::take_header(const attr_text &text, bool guessed) {
-    int new_kind = set_table_id(text.name);
-    if (new_kind >= 0) {
-        watch_stanza_end(new_kind);
-        watch_header(new_kind);
-        settle_broken(new_kind);
-    }
-    bool resource_open = cx.cb_rsrc_dattr.ra_cb_ID != 0;
-    bool class_open = cx.cb_rsrc_dattrC.ra_cb_ID != 0;
-    bool no_index = lost_index(new_kind);
-    header_errors = out.errors;
-    header_told = splits_stanza = false;
-    for (int tries = 0; tries < HEADER_TRIES; ++tries) {
-        auto before = std::tuple(cx.scp, cx.prev_scp, cx.curr_sd_scp, cx.state, cx.table_id);
-        cx.completing = -1;
-        try {
-            take_line(cx, text);
-            ranges_settled(resource_open, class_open, new_kind);
-            open_stanza(new_kind, guessed || header_told);
-            stanzas[index_of(new_kind)].misplaced = splits_stanza;
-            index_lost = index_lost || no_index;
-            return;
-        } catch (const fatal_exit &failure) {
-            std::tie(cx.scp, cx.prev_scp, cx.curr_sd_scp, cx.state, cx.table_id) = before;
-            if (new_kind < 0)
-                return unknown_header(text, failure);
-            if (!recover_header(failure, new_kind))
-                return;
-        }
-    }
-    skip_stanza();
-}
-
-/* What a line that could not be read seems to have been. */
-vx_uint32_t session::type_meant() const {
-    place at = here(mark_kind::name);
-    std::string_view name = std::string_view(raw).substr(at.column - 1, at.length);
-    const table_attrs *attr = find_attr(*cx.scp, name);
-    if (std::string_view meant = near_miss(name, attribute_names(*cx.scp)); attr == nullptr && !meant.empty())
-        attr = find_attr(*cx.scp, meant);
-    return attr == nullptr ? LOST_NAME : bit_of(attr->ta_type);
-}
-
-/* Whether a line belongs to another stanza, as one before it did. Notes it if it is the first: a second name, or an
- * attribute that this kind does not have. */
-bool session::misplaced(const fatal_exit &failure) {
-    const message &known = message_of(failure);
-    bool unknown = is_message(known, "S106") && (type_meant() & LOST_NAME) != 0;
-    bool repeated = is_message(known, "S109");
-    bool &before = stanzas[index_of(kind)].misplaced;
-    if (before)
-        return unknown || repeated || is_message(known, "S208");
-    if (unknown && cx.prev_scp != nullptr) { /* what is missed there is perhaps here */
-        stanza_state &previous = cx.stanzas[static_cast<size_t>(cx.prev_scp - sc_tables.data())];
-        previous.broken = previous.broken || previous.req_mask != cx.prev_scp->req_mask_cmplt;
-    }
-    before = unknown || (repeated && cx.latest.attr == &sc_tables[index_of(kind)].sc_attrs[0]);
-    return false;
-}
-
-void session::recover_attribute(const fatal_exit &failure) {
-    const message &known = message_of(failure);
-    if (kind < 0) { /* before any header */
-        error(failure, all_of_line());
-        return skip_stanza();
-    }
-    stanza_state &state = *cx.state;
-    stanza_note &stanza = stanzas[index_of(kind)];
-    int type = cx.latest.attr == nullptr ? -1 : cx.latest.attr->ta_type;
-    vx_uint32_t type_bit = type < 0 ? 0 : bit_of(type);
-    bool untyped = false;
-    if (cx.scp->dt_offset >= 0) {
-        vx_data_type_t data_type = VX_UNKNOWN;
-        memcpy(&data_type, static_cast<char *>(cx.scp->sc_cb(cx)) + cx.scp->dt_offset, sizeof data_type);
-        untyped = state.broken && data_type == VX_UNKNOWN;
-    }
-    bool follows = (untyped && (type_bit & TYPED) != 0 && is_message(known, "S207")) ||
-                   (is_message(known, "S208") && (stanza.failed & (VALID_VALUES | LOST_NAME)) != 0) ||
-                   misplaced(failure);
-    bool index = is_message(known, "S210");
-    if (index)
-        follows = index_lost || (other_index >= 0 && cx.curr_sdeli == other_index);
-    if (is_message(known, "S117")) {
-        follows = header_lost;
-        forge_class();
-    }
-    if (!follows && may_follow(failure))
-        add_notes(error(failure, here(known.mark, &failure)), failure, kind);
-    if (index) {
-        other_index = follows ? -1 : cx.expected_sdeli + 1;
-        bool read = cx.curr_sdeli + 1 != cx.expected_sdeli;
-        cx.expected_sdeli = read ? cx.curr_sdeli + 1 : cx.expected_sdeli + 1;
-        index_lost = false;
-    }
-    state.broken = true;
-    stanza.failed |= type_bit;
-    if (type < 0)
-        stanza.failed |= type_meant();
-    if (is_message(known, "S108")) {
-        stanza.failed &= ~type_bit;
-        take_quietly(std::string_view(raw).substr(0, all_of_line().column - 1 + all_of_line().length));
-    }
-    cx.conv_errno = 0; /* its mark would be a second report of the same number */
-}
+/* ---- Attribute lines --------------------------------------------------------------------------------------------- */
 
 void session::take_attribute(const attr_text &text) {
-    if (skipping)
+    if (skipping && set_table_id(text.name) < 0)
         return;
     cx.latest = {};
     int conversions = cx.conv_errno;
@@ -445,6 +125,8 @@ void session::note_given() {
         given = cx.linenum;
     if (cx.latest.attr->ta_type == AT_MANAGER)
         manager_line = cx.linenum;
+    if (kind == SC_CLASS_TO_MANAGER_MAPPING)
+        map_values.push_back({value_part(0, cx.latest.length), cx.latest.attr->ta_name, raw});
     if (cx.latest.attr->ta_type == AT_SD_INDEX)
         index_lost = false;
 }
@@ -479,14 +161,8 @@ void session::close_all() {
                 step(cx);
                 break;
             } catch (const fatal_exit &failure) {
-                int failed = cx.completing < 0 ? -1 : is_sd_kind(cx.completing) ? sd_kind : cx.completing;
-                bool told = failed >= 0 && cx.stanzas[index_of(failed)].broken;
-                bool lost = header_lost && std::string_view(failure.msg).starts_with("No ");
-                if (!told && !lost && may_follow(failure))
-                    add_notes(error(failure, here(mark_kind::none)), failure, failed);
-                if (failed < 0)
+                if (!recover_end(failure))
                     break;
-                abandon(failed, failure);
             }
         }
         ranges_settled(resource_open, class_open, -1);
@@ -502,7 +178,10 @@ void session::close_all() {
 
 void session::run() {
     try {
-        open_source(cx, cx.cdefsrc);
+        if (std::string_view(cx.cdefsrc) == "-") /* the descriptor itself: it may be no file, or half read */
+            take_source(cx, cx.cdefsrc, fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
+        else
+            open_source(cx, cx.cdefsrc);
         for (;;) {
             source_line source = next_line(cx);
             if (source.begin == nullptr)

@@ -1,29 +1,33 @@
 /* cdef_check_text.cpp: findings as compilers write them. */
 
 #include "cdef_check.h"
+#include "cdef_dump.h"
 
 #include <algorithm>
 
 namespace cdef::check {
 
-namespace {
+/* The bytes of the character that a text begins with: those of well-formed UTF-8, or else 1. */
+static std::size_t length_of(std::string_view text) {
+    return std::max<std::size_t>(dump::utf8_length(text), 1);
+}
 
-/* Nothing of a source may command a terminal. */
 std::string visible(std::string_view text) {
-    std::string shown(text);
-    for (char &c : shown)
-        if (c != '\t' && (static_cast<unsigned char>(c) < ' ' || c == '\x7F'))
-            c = '?';
+    std::string shown;
+    while (!text.empty()) {
+        std::size_t length = length_of(text);
+        bool harmless = text[0] == '\t' || dump::printable_length(text) != 0;
+        shown += harmless ? text.substr(0, length) : "?";
+        text.remove_prefix(length);
+    }
     return shown;
 }
 
-bool begins_character(char c) {
-    return (static_cast<unsigned char>(c) & 0xC0) != 0x80;
-}
+namespace {
 
 /* "file:line:column: ", as much of it as there is. */
 std::string prefix(const std::string &file, const place &at) {
-    std::string text = file + ":";
+    std::string text = visible(file) + ":";
     if (at.line != 0)
         text += std::to_string(at.line) + ":";
     if (at.line != 0 && at.column != 0)
@@ -35,21 +39,22 @@ std::string prefix(const std::string &file, const place &at) {
 std::string carets(std::string_view source, const place &at) {
     std::string text;
     size_t begin = std::min(at.column - 1, source.size());
-    for (char c : source.substr(0, begin))
-        if (begins_character(c))
-            text += c == '\t' ? '\t' : ' ';
-    std::string_view marked = source.substr(begin, at.length);
-    auto width = static_cast<size_t>(std::count_if(marked.begin(), marked.end(), begins_character));
+    for (size_t i = 0; i < begin; i += length_of(source.substr(i)))
+        text += source[i] == '\t' ? '\t' : ' ';
+    size_t end = begin + std::min(at.length, source.size() - begin);
+    size_t width = 0;
+    for (size_t i = begin; i < end; i += length_of(source.substr(i)))
+        ++width;
     return text + "^" + std::string(width > 1 ? width - 1 : 0, '~');
 }
 
-std::string excerpt(const finding &found) {
-    if (found.at.line == 0 || found.at.column == 0)
+std::string excerpt(const place &at, const std::string &source) {
+    if (at.line == 0 || at.column == 0)
         return {};
-    std::string number = std::to_string(found.at.line);
+    std::string number = std::to_string(at.line);
     std::string margin(std::max<size_t>(number.size(), 5), ' ');
-    return margin.substr(number.size()) + number + " | " + visible(found.source) + "\n" + margin + " | " +
-           carets(found.source, found.at) + "\n";
+    return margin.substr(number.size()) + number + " | " + visible(source) + "\n" + margin + " | " +
+           carets(source, at) + "\n";
 }
 
 } // namespace
@@ -59,9 +64,12 @@ std::string as_text(const result &checked) {
     for (const finding &found : checked.findings) {
         text += prefix(checked.file, found.at) + (found.error ? "error: " : "warning: ") + visible(found.text) + " [" +
                 found.code + (found.error ? "" : std::string(" ") + found.name) + "]\n";
-        text += excerpt(found);
-        for (const note &more : found.notes)
+        text += excerpt(found.at, found.source);
+        for (const note &more : found.notes) {
             text += prefix(checked.file, more.at) + "note: " + visible(more.text) + "\n";
+            if (!more.source.empty())
+                text += excerpt(more.at, more.source);
+        }
     }
     return text;
 }

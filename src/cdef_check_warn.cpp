@@ -3,15 +3,13 @@
 #include "cdef_check_session.h"
 
 #include <algorithm>
-#include <cerrno>
-#include <cstdlib>
-#include <limits>
+#include <utility>
 
 namespace cdef::check {
 
 namespace {
 
-constexpr size_t PIECE = 254; /* characters of a line that one read takes */
+constexpr size_t PIECE = 254; /* characters of a line that one read takes, the newline included */
 
 bool is_attribute_kind(int kind) {
     return kind >= 0 && sc_tables[index_of(kind)].sc_attr != nullptr;
@@ -25,67 +23,6 @@ bool is_action_run(int kind) {
     return kind == SC_ACTION_IN_SD_DEFINITION || kind == SC_ACTION_OUT_SD_DEFINITION;
 }
 
-vx_data_type_t data_type(cdgen &cx) {
-    vx_data_type_t type = VX_UNKNOWN;
-    memcpy(&type, static_cast<char *>(cx.scp->sc_cb(cx)) + cx.scp->dt_offset, sizeof type);
-    return type;
-}
-
-bool is_numeric(vx_data_type_t type) {
-    vx_data_type_t scalar = scalar_vx(type);
-    return scalar >= VX_INT32 && scalar <= VX_FLOAT64;
-}
-
-/* A number as the C library reads it. Plain ones are read without it. */
-struct number {
-    explicit number(std::string_view given, int base) : text(given) {
-        constexpr size_t SAFE_DIGITS = 18;
-        bool plain = !text.empty() && text.size() <= SAFE_DIGITS && (text[0] != '0' || text.size() == 1 || base == 10);
-        for (; plain && read < text.size() && text[read] >= '0' && text[read] <= '9'; ++read)
-            value = value * 10 + (text[read] - '0');
-        if (read == 0 || read < text.size())
-            convert(base);
-    }
-
-    void convert(int base) {
-        std::string copy(text);
-        errno = 0;
-        char *stop = nullptr;
-        value = std::strtol(copy.c_str(), &stop, base);
-        overflow = errno == ERANGE;
-        read = static_cast<size_t>(stop - copy.c_str());
-    }
-
-    std::string_view rest() const {
-        std::string_view left = text.substr(read);
-        return left.substr(std::min(left.find_first_not_of(" \t"), left.size()));
-    }
-
-    std::string_view text;
-    long value = 0;
-    size_t read = 0;
-    bool overflow = false;
-};
-
-/* Low and high of "low,high", with the offset of the second; both are the whole text if there is no comma. */
-struct pair_of_texts {
-    explicit pair_of_texts(std::string_view text) : low(text), high(text) {
-        size_t comma = text.find(',');
-        if (comma == std::string_view::npos)
-            return;
-        low = text.substr(0, comma);
-        high = text.substr(comma + 1);
-        offset = comma + 1;
-    }
-
-    bool two() const {
-        return offset > 0;
-    }
-
-    std::string_view low, high;
-    size_t offset = 0;
-};
-
 } // namespace
 
 std::string_view session::value_text() const {
@@ -96,17 +33,34 @@ std::string_view session::value_text() const {
 
 void session::watch_line(const source_line &source) {
     bool whole_piece = source.begin == cx.inbuf && raw.size() == PIECE;
-    if (seen.piece != 0)
+    rest_of_line = seen.piece != 0;
+    if (rest_of_line && !seen.piece_told)
         warn_at(
             LONG_LINE, {seen.piece, 0, 0}, {},
-            "line of more than 254 characters: the rest is read as a line of its own, and later lines count one more");
-    rest_of_line = seen.piece != 0;
+            "line of more than 253 characters: the rest is read as a line of its own, and later lines count one more");
+    seen.piece_told = rest_of_line;
     seen.piece = whole_piece ? cx.linenum : 0;
-    if (raw.ends_with('\r') && !seen.carriage_returns) {
-        seen.carriage_returns = true;
-        warn(CARRIAGE_RETURN, {cx.linenum, raw.size(), 1},
-             "carriage return at the end of a line, which belongs to the line's text");
+    if (!seen.carriage_returns)
+        watch_returns(source);
+}
+
+/* Where the next one stands is found once, however many lines stand before it; as the reader's marks are. */
+void session::watch_returns(const source_line &source) {
+    const source_file &file = cx.cdb_fp;
+    bool cut = source.begin == cx.inbuf;
+    bool filled_anew = source.begin == file.buffer.data();
+    if (cut || filled_anew || seen.next_return < source.begin) {
+        const char *end = cut ? source.end : file.buffer.data() + file.end;
+        const void *found = memchr(source.begin, '\r', static_cast<size_t>(end - source.begin));
+        seen.next_return = found == nullptr ? end : static_cast<const char *>(found);
     }
+    const char *next = cut ? std::exchange(seen.next_return, nullptr) : seen.next_return;
+    if (next >= source.end)
+        return;
+    auto at = static_cast<size_t>(next - source.begin);
+    seen.carriage_returns = true;
+    const char *where = at + 1 == raw.size() ? "carriage return at the end of a line" : "carriage return within a line";
+    warn(CARRIAGE_RETURN, {cx.linenum, at + 1, 1}, std::string(where) + ", which belongs to the line's text");
 }
 
 /* ---- Stanzas -------------------------------------------------------------------------------------------------- */
@@ -125,11 +79,22 @@ static name_list unchecked_missing(session &check) {
     return names;
 }
 
+void session::watch_complete() {
+    name_list names = unchecked_missing(*this);
+    const stanza_note &stanza = stanzas[index_of(kind)];
+    if (names.empty() || !warn_at(INCOMPLETE, stanza.header, stanza.source,
+                                  quoted(sc_tables[index_of(kind)].sc_name) + " lacks " + listed(names)))
+        return;
+    if (is_sd_kind(kind))
+        index_missing = stanza.header.line;
+    bool unnamed = std::find(names.begin(), names.end(), "VariableClass") != names.end();
+    seen.variable_class_unnamed = seen.variable_class_unnamed || unnamed;
+}
+
 void session::watch_stanza_end(int next_kind) {
-    if (kind >= 0 && !skipping && !cx.stanzas[index_of(kind)].broken)
-        if (name_list names = unchecked_missing(*this); !names.empty())
-            warn_at(INCOMPLETE, stanzas[index_of(kind)].header, stanzas[index_of(kind)].source,
-                    quoted(sc_tables[index_of(kind)].sc_name) + " lacks " + listed(names));
+    bool map_again = kind == SC_CLASS_TO_MANAGER_MAPPING && next_kind == kind; /* which is an error */
+    if (kind >= 0 && !skipping && !map_again && !cx.stanzas[index_of(kind)].broken)
+        watch_complete();
     bool runs_on = next_kind >= 0 && is_attribute_run(next_kind);
     bool reported = seen.sd_attribute.line == 0;
     if (reported || runs_on) {
@@ -148,11 +113,10 @@ void session::watch_stanza_end(int next_kind) {
 
 void session::watch_header(int new_kind) {
     bool begins_run = is_sd_kind(new_kind) && (cx.cb_sd_def.sd_cb_ID == 0 || kind != new_kind);
-    if (begins_run) {
+    if (begins_run)
         seen.known[index_of(new_kind)].names.clear();
-        odd_elements.clear();
-    }
-    if (begins_run && is_action_run(new_kind) && cx.cb_rsrc_action.ac_cb_ID == 0 && cx.cb_rsrc_actionC.ac_cb_ID == 0)
+    if (begins_run && is_action_run(new_kind) && !owner_lost && cx.cb_rsrc_action.ac_cb_ID == 0 &&
+        cx.cb_rsrc_actionC.ac_cb_ID == 0)
         warn(STRAY_RUN, all_of_line(), "no action is open: these elements belong to nothing");
     if (new_kind != SC_CONTROL_DEFINITION || cx.cb_rsrc_class.rc_cb_ID == 0)
         return;
@@ -172,18 +136,47 @@ void session::watch_header(int new_kind) {
     }
 }
 
+/* In place: this is done for each attribute and element. */
+void session::note_type(std::string_view text) {
+    mention &type = stanzas[index_of(kind)].data_type;
+    type.at = value_part(0, text.size());
+    type.text = text;
+    type.source = raw;
+}
+
 /* ---- Attributes ----------------------------------------------------------------------------------------------- */
+
+void session::watch_permission(std::string_view text, const place &at) {
+    bool known = std::any_of(std::begin(perm_list), std::end(perm_list),
+                             [&](const valid_perms_t &each) { return each.permission == text[0]; });
+    if (!known)
+        warn(PERMISSION, at, "no permission has this letter, so that none is needed",
+             {{at, "the letters are q, l, e, v, d, c, s, o, a and x"}});
+    else if (text.size() > 1)
+        warn(PERMISSION, at, "only the first letter of a Permission counts");
+}
+
+/* Where the element's default is asked for, the compiler may refuse the type at the run's end. */
+void session::watch_element_type(std::string_view text, const place &at) {
+    bool unknown = data_type(cx) == VX_UNKNOWN;
+    note_type(text);
+    if (cx.attr_dflt_val != nullptr && (unknown || text == "SBS"))
+        odd_elements.push_back({at, std::string(text), raw});
+    else if (unknown)
+        warn(ELEMENT_TYPE, at, "unknown data type: the element gets none", {{at, type_suggestion(text, true)}});
+}
 
 void session::watch_attribute() {
     const table_attrs &attr = *cx.latest.attr;
     std::string_view text = value_text();
     place at = value_part(0, cx.latest.length);
     watch_quotes();
+    if (stanzas[index_of(kind)].misplaced)
+        return; /* the value may be another attribute's */
     watch_numbers();
     switch (attr.ta_type) {
     case AT_STRING:
     case AT_SD_NAME:
-    case AT_ID:
         return watch_name();
     case AT_LOCATOR:
         seen.locator = mention{at, std::string(text), raw};
@@ -195,155 +188,21 @@ void session::watch_attribute() {
             warn(UNUSED_DEFAULT, here(mark_kind::name),
                  "the default of a class attribute is that of its type: this one is never used");
         return;
-    case AT_PERMISSION: {
-        bool known = std::any_of(std::begin(perm_list), std::end(perm_list),
-                                 [&](const valid_perms_t &each) { return each.permission == text[0]; });
-        if (!known)
-            warn(PERMISSION, at, "no permission has this letter, so that none is needed",
-                 {{at, "the letters are q, l, e, v, d, c, s, o, a and x"}});
-        else if (text.size() > 1)
-            warn(PERMISSION, at, "only the first letter of a Permission counts");
-        return;
-    }
+    case AT_PERMISSION:
+        return watch_permission(text, at);
     case AT_DATA_TYPE:
-        stanzas[index_of(kind)].data_type = at;
+        note_type(text);
         if (scalar_vx(data_type(cx)) == VX_SD_PTR) {
             seen.sd_attribute = stanzas[index_of(kind)].header;
             seen.sd_source = stanzas[index_of(kind)].source;
             seen.sd_run = false;
         }
         return;
-    case AT_SD_DATA_TYPE: {
-        bool unknown = data_type(cx) == VX_UNKNOWN;
-        if (cx.attr_dflt_val != nullptr && (unknown || text == "SBS"))
-            odd_elements.push_back({at, std::string(text), {}});
-        else if (unknown)
-            warn(ELEMENT_TYPE, at, "unknown data type: the element gets none",
-                 {{at, suggestion(text, data_type_names())}});
-        return;
-    }
+    case AT_SD_DATA_TYPE:
+        return watch_element_type(text, at);
     default:
         return;
     }
-}
-
-/* ---- Numbers -------------------------------------------------------------------------------------------------- */
-
-/* A number16 or number32, or one part of it. */
-void session::watch_number(std::string_view text, size_t offset, int bits) {
-    number n(text, 0);
-    place at = value_part(offset, text.size());
-    long limit = (1L << bits) - 1;
-    if (n.read == 0 || !n.rest().empty())
-        warn(NUMBER_TEXT, at,
-             n.read == 0 ? "no number: it is read as 0"
-                         : "only the number in front counts: it is read as " + std::to_string(n.value));
-    if (n.overflow || n.value < 0 || n.value > limit)
-        warn(NARROWED, at,
-             "does not fit " + std::to_string(bits) + " bits: it is stored as " + std::to_string(n.value & limit));
-    size_t digits = text.find_first_not_of(" \t+-");
-    bool octal = digits != std::string_view::npos && digits + 1 < n.read && text[digits] == '0' &&
-                 text[digits + 1] >= '0' && text[digits + 1] <= '7';
-    if (octal)
-        warn(OCTAL, at, "a leading 0 makes it octal: it is read as " + std::to_string(n.value));
-}
-
-/* A value of the attribute's own type, or one part of it. */
-void session::watch_typed(std::string_view text, size_t offset) {
-    vx_data_type_t type = scalar_vx(data_type(cx));
-    place at = value_part(offset, text.size());
-    if (type != VX_INT32 && type != VX_UINT32 && type != VX_UINT64)
-        return;
-    number n(text, 10);
-    if (type == VX_INT32 && (n.overflow || n.value != static_cast<vx_int32_t>(n.value)))
-        warn(NARROWED, at, "does not fit Int32: it is stored as " + std::to_string(static_cast<vx_int32_t>(n.value)));
-    if (type == VX_UINT32 && (n.overflow || n.value != static_cast<long>(static_cast<vx_uint32_t>(n.value))))
-        warn(NARROWED, at, "does not fit UInt32: it is stored as " + std::to_string(static_cast<vx_uint32_t>(n.value)));
-    if (type == VX_UINT64 && n.value < 0)
-        warn(NARROWED, at, "does not fit UInt64: it is stored as " + std::to_string(static_cast<vx_uint64_t>(n.value)));
-}
-
-void session::watch_version() {
-    std::string_view text = value_text();
-    size_t offset = 0;
-    for (int part = 0; part < 4 && offset <= text.size(); ++part) {
-        size_t dot = std::min(text.find('.', offset), text.size());
-        std::string_view piece = text.substr(offset, dot - offset);
-        number n(piece, 10);
-        if (!n.rest().empty())
-            warn(NUMBER_TEXT, value_part(offset, piece.size()),
-                 "only the number in front counts: it is read as " + std::to_string(n.value));
-        if (n.overflow || n.value < 0 || n.value > 255)
-            warn(NARROWED, value_part(offset, piece.size()), "a part of a version has 8 bits");
-        offset = dot + 1;
-    }
-    if (offset <= text.size())
-        warn(NUMBER_TEXT, value_part(offset, text.size() - offset), "a version has four parts: these are cut off");
-}
-
-void session::watch_numbers() {
-    std::string_view text = value_text();
-    switch (cx.latest.attr->ta_type) {
-    case AT_UINT16:
-    case AT_SD_DESCRIPTION:
-    case AT_SD_DISPLAY:
-    case AT_VALUE_DISPLAY:
-    case AT_SD_VALUE_DISPLAY:
-        return watch_number(text, 0, 16);
-    case AT_ID:
-        return watch_number(text, 0, 32);
-    case AT_VARIETY: {
-        pair_of_texts both(text);
-        watch_number(both.low, 0, 32);
-        watch_number(both.high, both.offset, 32);
-        return watch_bounds();
-    }
-    case AT_VERSION:
-        return watch_version();
-    case AT_DEFAULT_VALUE:
-    case AT_INITIAL_VALUE:
-        return watch_typed(text, 0);
-    case AT_VALID_VALUE:
-    case AT_SD_VALID_VALUE:
-    case AT_RANGE:
-        return watch_valid(text);
-    default:
-        return;
-    }
-}
-
-void session::watch_valid(std::string_view text) {
-    if (!is_numeric(data_type(cx)))
-        return;
-    pair_of_texts both(text);
-    watch_typed(both.low, 0);
-    if (!both.two())
-        return;
-    watch_typed(both.high, both.offset);
-    watch_bounds();
-}
-
-/* Values that fit their type; others have been warned of. */
-void session::watch_bounds() {
-    std::string_view text = value_text();
-    pair_of_texts both(text);
-    if (!both.two())
-        return;
-    bool variety = cx.latest.attr->ta_type == AT_VARIETY;
-    vx_data_type_t type = variety ? VX_UINT32 : scalar_vx(data_type(cx));
-    bool above = false;
-    if (type == VX_FLOAT32 || type == VX_FLOAT64) {
-        above =
-            std::strtod(std::string(both.low).c_str(), nullptr) > std::strtod(std::string(both.high).c_str(), nullptr);
-    } else if (type == VX_UINT64) {
-        above = std::strtoull(std::string(both.low).c_str(), nullptr, 10) >
-                std::strtoull(std::string(both.high).c_str(), nullptr, 10);
-    } else {
-        int base = variety ? 0 : 10;
-        above = number(both.low, base).value > number(both.high, base).value;
-    }
-    if (above)
-        warn(LOW_ABOVE_HIGH, value_part(0, cx.latest.length), "the lower bound is above the upper one");
 }
 
 /* ---- Names, ranges, quotes ------------------------------------------------------------------------------------ */
@@ -355,14 +214,17 @@ void session::watch_name() {
     if (attr == "VariableClass" && kind == SC_RESOURCE_VARIABLE_CLASS)
         seen.defined_variable_classes.of(text) = cx.linenum;
     if (attr == "VariableClass" && kind != SC_RESOURCE_VARIABLE_CLASS)
-        seen.variable_classes.push_back({at, std::string(text), raw});
+        watch_variable_class(text, at);
     known_values &known = seen.known[index_of(kind)];
     if ((attr == "Name" || attr == "ElementName") && kind != SC_RESOURCE_CLASS)
         watch_first(SAME_NAME, known.names.of(text), at, "name");
-    if (attr == "Id") {
-        auto id = static_cast<vx_uint32_t>(number(text, 0).value);
-        watch_first(SAME_ID, known.ids.of(id), at, "Id");
-    }
+}
+
+void session::watch_variable_class(std::string_view text, const place &at) {
+    int &first = seen.variable_class_names.of(text);
+    if (first == 0)
+        seen.variable_classes.push_back({at, std::string(text), raw});
+    first = cx.linenum;
 }
 
 void session::watch_first(warning_id id, int &first, const place &at, const char *what) {
@@ -392,8 +254,9 @@ void session::ranges_settled(bool resource_was_open, bool class_was_open, int ne
     if ((!of_resource && !of_class) || next_kind == SC_CONTROL_DEFINITION)
         return;
     int completed = of_resource ? SC_DYNAMIC_RESOURCE_ATTRIBUTE : SC_DYNAMIC_CLASS_ATTRIBUTE;
+    bool lost = may_be_lost(SC_DYNAMIC_RESOURCE_ATTRIBUTE) || may_be_lost(SC_DYNAMIC_CLASS_ATTRIBUTE);
     for (const pending_range &range : seen.ranges)
-        if (range.kind != completed)
+        if (range.kind != completed && !lost)
             warn_at(RANGE_ELSEWHERE, range.at, range.source,
                     "this Range is lost: a " + quoted(sc_tables[index_of(completed)].sc_name) + " is completed first",
                     {{stanzas[index_of(completed)].header, "begun here"}});
@@ -415,6 +278,19 @@ void session::watch_quotes() {
 
 /* ---- The end of the source ------------------------------------------------------------------------------------ */
 
+void session::watch_variable_classes() {
+    constexpr size_t SEARCHED_MAX = 1'000'000; /* names that are compared, for the work not to be quadratic */
+    name_list defined = seen.defined_variable_classes.all();
+    size_t searched = 0;
+    for (const mention &named : seen.variable_classes) {
+        if (seen.defined_variable_classes.has(named.text))
+            continue;
+        bool search = (searched += defined.size()) <= SEARCHED_MAX;
+        warn_at(UNKNOWN_VARIABLE_CLASS, named.at, named.source, "no `ResourceVariableClass` has this name",
+                {{named.at, search ? suggestion(named.text, defined) : std::string()}});
+    }
+}
+
 /* What names something is looked at only if everything that could be named has been read. */
 void session::watch_end() {
     if (out.errors > 0)
@@ -424,70 +300,10 @@ void session::watch_end() {
         warn_at(UNKNOWN_LOCATOR, seen.locator->at, seen.locator->source,
                 "no `PersistentResourceAttribute` has this name",
                 {{seen.locator->at, suggestion(seen.locator->text, attributes.all())}});
-    for (const mention &named : seen.variable_classes)
-        if (!seen.defined_variable_classes.has(named.text))
-            warn_at(UNKNOWN_VARIABLE_CLASS, named.at, named.source, "no `ResourceVariableClass` has this name",
-                    {{named.at, suggestion(named.text, seen.defined_variable_classes.all())}});
+    if (!seen.variable_class_unnamed)
+        watch_variable_classes();
     for (finding &found : out.findings)
         std::erase_if(found.notes, [](const note &each) { return each.text.empty(); });
-}
-
-/* ---- Texts and their first lines ------------------------------------------------------------------------------ */
-
-static unsigned tag_of(size_t hash) {
-    return static_cast<unsigned>(hash >> 32);
-}
-
-size_t first_lines::slot_of(std::string_view text, size_t hash) const {
-    size_t mask = slots.size() - 1;
-    size_t at = hash & mask;
-    for (; slots[at].position != 0; at = (at + 1) & mask)
-        if (slots[at].tag == tag_of(hash) && text_of(entries[slots[at].position - 1]) == text)
-            break;
-    return at;
-}
-
-void first_lines::grow() {
-    constexpr size_t FEWEST = 64;
-    size_t size = std::max(FEWEST, 2 * slots.size());
-    slots.assign(size, {0, 0});
-    for (size_t i = 0; i < entries.size(); ++i) {
-        size_t at = entries[i].hash & (size - 1);
-        while (slots[at].position != 0)
-            at = (at + 1) & (size - 1);
-        slots[at] = {tag_of(entries[i].hash), static_cast<unsigned>(i + 1)};
-    }
-}
-
-int &first_lines::of(std::string_view text, size_t hash) {
-    if (2 * entries.size() >= slots.size())
-        grow();
-    slot &found = slots[slot_of(text, hash)];
-    if (found.position == 0) {
-        entries.push_back({hash, texts.size(), text.size(), 0});
-        texts += text;
-        found = {tag_of(hash), static_cast<unsigned>(entries.size())};
-    }
-    return entries[found.position - 1].line;
-}
-
-bool first_lines::has(std::string_view text) const {
-    return !slots.empty() && slots[slot_of(text, std::hash<std::string_view>()(text))].position != 0;
-}
-
-name_list first_lines::all() const {
-    name_list names;
-    for (const entry &each : entries)
-        names.push_back(text_of(each));
-    return names;
-}
-
-void first_lines::clear() {
-    if (entries.empty())
-        return;
-    texts.clear();
-    entries.clear();
-    std::fill(slots.begin(), slots.end(), slot{0, 0});
 }
 
 } // namespace cdef::check

@@ -26,9 +26,27 @@ bool tolerable(const cdb::finding &finding) {
            std::find(tolerated.begin(), tolerated.end(), finding.broken->code) != tolerated.end();
 }
 
+/* From the descriptor itself: it may be no file, or half read. */
+std::vector<std::byte> standard_input(std::error_code &error) {
+    constexpr std::size_t STEP = 65536;
+    std::vector<std::byte> contents;
+    for (ssize_t got = 1; got != 0;) {
+        std::size_t size = contents.size();
+        contents.resize(size + STEP);
+        got = read(STDIN_FILENO, contents.data() + size, STEP);
+        bool again = got < 0 && errno == EINTR;
+        if (got < 0 && !again) {
+            error = {errno, std::generic_category()};
+            return {};
+        }
+        contents.resize(size + (again ? 0 : static_cast<std::size_t>(got)));
+    }
+    return contents;
+}
+
 std::vector<std::byte> contents_of(const std::string &path) {
     std::error_code error;
-    std::vector<std::byte> contents = cdb::read_file(path == "-" ? "/dev/stdin" : path.c_str(), error);
+    std::vector<std::byte> contents = path == "-" ? standard_input(error) : cdb::read_file(path.c_str(), error);
     if (error)
         throw trouble(path + ": " + error.message());
     return contents;
@@ -36,12 +54,12 @@ std::vector<std::byte> contents_of(const std::string &path) {
 
 } // namespace
 
-/* Names of files are part of messages, and a name may hold anything. */
-static void complain(const std::string &text) {
-    std::fprintf(stderr, "cdef: %s\n", dump::harmless(text).c_str());
-}
-
 input::input(const std::string &path) : name(path), contents(contents_of(path)), db(contents) {}
+
+/* Names of files are part of messages, and a name may hold anything. */
+void tell(const std::string &trouble) {
+    std::fprintf(stderr, "cdef: %s\n", dump::harmless(trouble).c_str());
+}
 
 std::vector<cdb::finding> require_readable(const input &in) {
     std::vector<cdb::finding> findings = cdb::verify(in.db);
@@ -56,7 +74,7 @@ void require_readable_aloud(const input &in) {
         auto found = std::find_if(findings.begin(), findings.end(),
                                   [code](const cdb::finding &f) { return f.broken->code == code; });
         if (found != findings.end())
-            complain(in.name + ": " + std::string(found->broken->title));
+            tell(in.name + ": " + std::string(found->broken->title));
     }
 }
 
@@ -162,7 +180,7 @@ int main(int argc, char **argv) {
         try {
             return cdef::run(argc, argv);
         } catch (const std::exception &trouble) {
-            cdef::complain(trouble.what());
+            cdef::tell(trouble.what());
         }
     } catch (...) {
         std::fputs("cdef: out of memory\n", stderr);

@@ -80,14 +80,20 @@ int verify(const verify_options &options) {
     json all = json::array();
     std::string text;
     bool pass = true;
+    bool read = true;
     for (const std::string &file : options.files) {
-        verdict v = judge(file, options);
-        pass = pass && v.passes;
-        text += v.text;
-        all.push_back(std::move(v.data));
+        try {
+            verdict v = judge(file, options);
+            pass = pass && v.passes;
+            text += v.text;
+            all.push_back(std::move(v.data));
+        } catch (const trouble &unreadable) {
+            tell(unreadable.what());
+            read = false;
+        }
     }
     print(options.as_json ? json_text(all) : text);
-    return pass ? OK : FOUND;
+    return !read ? TROUBLE : pass ? OK : FOUND;
 }
 
 } // namespace

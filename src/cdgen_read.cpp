@@ -204,8 +204,12 @@ int above_stdio(int fd) {
 }
 
 void open_source(cdgen &cx, const char *filename) {
+    take_source(cx, filename, above_stdio(open(filename, O_RDONLY | O_CLOEXEC)));
+}
+
+void take_source(cdgen &cx, const char *filename, int fd) {
     source_file &source = cx.cdb_fp;
-    source.fd = above_stdio(open(filename, O_RDONLY | O_CLOEXEC));
+    source.fd = fd;
     struct stat st = {};
     if (source.fd < 0 || fstat(source.fd, &st) != 0)
         cdgen_error_exit(cx, filename, ": cannot open because: ", strerror(errno), 0, errno);

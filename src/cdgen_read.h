@@ -14,6 +14,9 @@ struct source_line {
 /* Fatal if the source cannot be opened or, later, read. */
 void open_source(cdgen &cx, const char *filename);
 
+/* The same for a descriptor that is open, or -1 with errno; it is the context's from now on. */
+void take_source(cdgen &cx, const char *filename, int fd);
+
 /* The next line, or the next 254 characters of a longer one, and counts it. It stays until the next call. */
 source_line next_line(cdgen &cx);
 

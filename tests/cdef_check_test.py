@@ -9,7 +9,6 @@ messages and the sources name the same messages.
 """
 
 import argparse
-import json
 import pathlib
 import re
 import shlex
@@ -99,6 +98,9 @@ def check_tables(root):
             problems.append(f"docs/messages.md: {code} is in no table")
     codes = [row[0] for row in errors + warnings]
     problems += [f"{code} is given twice" for code in set(codes) if codes.count(code) > 1]
+    example = (root / "tests/cdef/check/disk.expect").read_text().partition("---\n")[2]
+    if f"```\n{example}```\n" not in (root / "README.md").read_text():
+        problems.append("README.md: the example is not what tests/cdef/check/disk.expect says")
     known = {text for _, text in errors}
     problems += [f"no code for {text!r}" for text in sorted(raised(root) - known)]
     problems += [f"nothing in src raises {text!r}" for text in sorted(known - raised(root))]
@@ -107,35 +109,15 @@ def check_tables(root):
     return problems
 
 
-def check_sarif(cdef, source):
-    """Whether a SARIF log has what the standard requires of the parts that are used."""
-    status, text, _ = run(cdef, ["--format", "sarif"], source)
-    log = json.loads(text)
-    (only,) = log["runs"]
-    rules = {rule["id"] for rule in only["tool"]["driver"]["rules"]}
-    problems = [] if (status, log["version"]) == (1, "2.1.0") and only["results"] else ["no results, or wrong version"]
-    for result in only["results"]:
-        if result["ruleId"] not in rules or result["level"] not in ("error", "warning"):
-            problems.append(f"rule or level: {result}")
-        for place in result["locations"] + result.get("relatedLocations", []):
-            region = place["physicalLocation"].get("region", {"startLine": 1})
-            if region["startLine"] < 1 or region.get("endColumn", 1) < region.get("startColumn", 1):
-                problems.append(f"region: {place}")
-    return problems
-
-
 def main():
     """Run the cases, or check the tables."""
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--cdef", type=lambda text: pathlib.Path(text).resolve())
     parser.add_argument("--tables", action="store_true")
-    parser.add_argument("--sarif", type=lambda text: pathlib.Path(text).resolve())
     parser.add_argument("cases", nargs="*", type=lambda text: pathlib.Path(text).resolve())
     options = parser.parse_args()
     root = pathlib.Path(__file__).resolve().parent.parent
     problems = check_tables(root) if options.tables else []
-    if options.sarif:
-        problems += check_sarif(options.cdef, options.sarif)
     for case in options.cases:
         problems += [f"FAIL {case}", *found] if (found := check_case(options.cdef, case)) else []
     print(*problems, sep="\n")

@@ -314,7 +314,7 @@ CHANGED_NUMBERS = [
     ("errors", "u32 336 0", "- error 'err'\n+ error 'E'\n"),
     ("errors", "u32 360 1", "~ error 'err': permission 0x6 -> q\n"),
     ("errors", "u32 388 5", "- error 'err', variety 1 to 1\n+ error 'err', variety 1 to 5\n"),
-    ("errors", "u32 400 0", "- error 'err', input element 'err'\n+ error 'err', input element 'E'\n"),
+    ("errors", "u32 400 0", "- error 'err', input element 'el'\n+ error 'err', input element 'E'\n"),
     ("errors", "u32 368 9", "~ dependency 8: rd_cb_ID 7 -> 9\n"),
     ("errors", "u16 372 9", "- dependency 8\n+ dependency 9\n"),
     ("hash", "u32 96 9", "~ class hash: rch_cb_ID 1 -> 9\n"),

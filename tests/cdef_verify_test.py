@@ -9,6 +9,7 @@ import json
 import os
 import pathlib
 import re
+import socket
 import subprocess
 import sys
 import tempfile
@@ -181,9 +182,27 @@ class Input(unittest.TestCase):
     def test_missing_file(self):
         self.assertEqual(verify("none.cdef"), (2, "", "cdef: none.cdef: No such file or directory\n"))
 
-    def test_missing_file_outweighs_an_error(self):
-        status, _, messages = verify(WRONG, "none.cdef")
-        self.assertEqual((status, messages), (2, "cdef: none.cdef: No such file or directory\n"))
+    def test_standard_input_that_is_a_socket(self):
+        ours, theirs = socket.socketpair()
+        with ours, theirs:
+            ours.sendall((OPTIONS.images / WRONG).read_bytes())
+            ours.shutdown(socket.SHUT_WR)
+            self.assertEqual(verify("-", stdin=theirs), (1, WRONG_LINE.format("-"), ""))
+
+    def test_standard_input_from_where_it_stands(self):
+        with tempfile.TemporaryFile() as file:
+            file.write(b"front" + (OPTIONS.images / WRONG).read_bytes())
+            file.flush()
+            os.lseek(file.fileno(), len(b"front"), os.SEEK_SET)
+            self.assertEqual(verify("-", stdin=file), (1, WRONG_LINE.format("-"), ""))
+
+    def test_missing_file_outweighs_an_error_and_hides_none(self):
+        missing = "cdef: none.cdef: No such file or directory\n"
+        lines = WRONG_LINE.format(WRONG) + CARELESS_LINE.format(CARELESS)
+        self.assertEqual(verify(WRONG, "none.cdef", CARELESS), (2, lines, missing))
+        status, text, messages = verify("--json", "none.cdef", WRONG, "broken")
+        self.assertEqual((status, messages), (2, missing + "cdef: broken: Is a directory\n"))
+        self.assertEqual([each["file"] for each in json.loads(text)], [WRONG])
 
     def test_directory(self):
         self.assertEqual(verify("broken"), (2, "", "cdef: broken: Is a directory\n"))

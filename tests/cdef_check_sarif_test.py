@@ -1,0 +1,109 @@
+"""Test that `cdef check --format sarif` writes SARIF 2.1.0: each log is like
+cdef/sarif_schema.json, whatever is found and wherever it is, and says what
+`--format json` says.
+"""
+
+import argparse
+import copy
+import json
+import pathlib
+import subprocess
+import sys
+import tempfile
+import unittest
+
+import jsonschema
+
+OPTIONS = argparse.Namespace()
+CASES = pathlib.Path(__file__).resolve().parent / "cdef/check"
+SCHEMA = jsonschema.Draft7Validator(json.loads((CASES.parent / "sarif_schema.json").read_text()))
+
+
+def check(form, *sources):
+    """What is found in the sources, in a form."""
+    command = [OPTIONS.cdef, "check", "--format", form, *sources]
+    result = subprocess.run(command, cwd=CASES, capture_output=True, check=False, timeout=60)
+    return json.loads(result.stdout)
+
+
+class Logs(unittest.TestCase):
+    """Logs of all kinds."""
+
+    def sarif(self, *sources):
+        """A log, which is checked."""
+        log = check("sarif", *sources)
+        self.assertEqual([f"{error.json_path}: {error.message}" for error in SCHEMA.iter_errors(log)], [])
+        (run,) = log["runs"]
+        rules = {rule["id"] for rule in run["tool"]["driver"]["rules"]}
+        self.assertLessEqual({result["ruleId"] for result in run["results"]}, rules)
+        for place in (each for result in run["results"] for each in result["locations"] + result.get("relatedLocations", [])):
+            region = place["physicalLocation"].get("region", {})
+            self.assertLessEqual(region.get("startColumn", 1), region.get("endColumn", 1))
+        return run["results"]
+
+    def test_nothing_found(self):
+        self.assertEqual(self.sarif("sound.cdefsrc"), [])
+
+    def test_without_a_region(self):
+        results = self.sarif("empty.cdefsrc")
+        self.assertEqual([result["ruleId"] for result in results], ["S301", "S302"])
+        for result in results:
+            self.assertNotIn("region", result["locations"][0]["physicalLocation"])
+
+    def test_without_a_column(self):
+        region = self.sarif("keys.cdefsrc")[0]["locations"][0]["physicalLocation"]["region"]
+        self.assertEqual(region, {"startLine": 13})
+
+    def test_all_cases(self):
+        sources = sorted(path.name for path in CASES.glob("*.cdefsrc"))
+        found = [(each["file"], one) for each in check("json", *sources) for one in each["findings"]]
+        results = self.sarif(*sources)
+        self.assertGreater(len(results), len(sources))
+        self.assertEqual(len(results), len(found))
+        for result, (file, one) in zip(results, found):
+            place = result["locations"][0]["physicalLocation"]
+            said = (result["ruleId"], result["level"], result["message"]["text"], place["artifactLocation"]["uri"])
+            self.assertEqual(said, (one["code"], one["severity"], one["message"], file))
+            self.assertEqual(place.get("region", {}).get("startLine"), one["line"])
+            notes = [note["message"]["text"] for note in result.get("relatedLocations", [])]
+            self.assertEqual(notes, [note["message"] for note in one["notes"]])
+
+    def test_names_that_are_no_uri(self):
+        with tempfile.TemporaryDirectory() as directory:
+            source = pathlib.Path(directory) / "a b:%\u00e4#?.cdefsrc"
+            source.write_bytes((CASES / "keys.cdefsrc").read_bytes())
+            place = self.sarif(source)[0]["locations"][0]["physicalLocation"]
+        self.assertTrue(place["artifactLocation"]["uri"].endswith("/a%20b%3A%25%C3%A4%23%3F.cdefsrc"))
+
+
+class Schema(unittest.TestCase):
+    """What the schema refuses."""
+
+    def test_changed_logs(self):
+        good = check("sarif", "unknown-attribute.cdefsrc")
+        changes = (
+            lambda log: log.update(version="2.0.0"),
+            lambda log: log.pop("runs"),
+            lambda log: log["runs"][0]["tool"].pop("driver"),
+            lambda log: log["runs"][0]["results"][0].pop("message"),
+            lambda log: log["runs"][0]["results"][0].update(level="fatal"),
+            lambda log: log["runs"][0]["results"][0].update(line=1),
+            lambda log: log["runs"][0]["results"][0]["locations"][0]["physicalLocation"]["region"].update(startLine=0),
+        )
+        self.assertTrue(SCHEMA.is_valid(good))
+        for change in changes:
+            bad = copy.deepcopy(good)
+            change(bad)
+            self.assertFalse(SCHEMA.is_valid(bad))
+
+
+def main():
+    """Run the tests."""
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--cdef", required=True, type=lambda text: pathlib.Path(text).resolve())
+    parser.parse_args(namespace=OPTIONS)
+    unittest.main(argv=[sys.argv[0]])
+
+
+if __name__ == "__main__":
+    main()

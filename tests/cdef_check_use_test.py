@@ -1,0 +1,199 @@
+"""Test how `cdef check` is used: many sources, ones that cannot be read, standard
+input of all kinds, and its exit statuses.  What it says of a source, the cases
+of cdef_check_test.py test.
+"""
+
+import argparse
+import json
+import os
+import pathlib
+import re
+import shutil
+import socket
+import subprocess
+import sys
+import tempfile
+import unittest
+
+OPTIONS = argparse.Namespace()
+EDITORS = pathlib.Path(__file__).resolve().parent.parent / "editors"
+CASES = pathlib.Path(__file__).resolve().parent / "cdef/check"
+
+WRONG = "data-type.cdefsrc"
+ODD = "permission.cdefsrc"
+RIGHT = "sound.cdefsrc"
+MISSING = "cdef: missing: cannot open because: No such file or directory\n"
+DIRECTORY = "cdef: .: cannot read because: Is a directory\n"
+
+
+def check(*operands, stdin=subprocess.DEVNULL):
+    """Status, output and messages of `cdef check`, run among the cases."""
+    result = subprocess.run(
+        [OPTIONS.cdef, "check", *operands], cwd=CASES, stdin=stdin, capture_output=True, check=False, timeout=60)
+    return result.returncode, result.stdout.decode(), result.stderr.decode()
+
+
+def expected(source, shown=None):
+    """What is said of a case's source, under its own or another name."""
+    text = (CASES / source).with_suffix(".expect").read_text().partition("---\n")[2]
+    return text.replace(f"{source}:", f"{shown or source}:")
+
+
+class Sources(unittest.TestCase):
+    """One or many, and which of them cannot be read."""
+
+    def test_the_worst_decides(self):
+        self.assertEqual(check(RIGHT, ODD), (0, "", expected(ODD)))
+        self.assertEqual(check(ODD, WRONG, RIGHT), (1, "", expected(ODD) + expected(WRONG)))
+        self.assertEqual(check("--werror", RIGHT, ODD), (1, "", expected(ODD)))
+
+    def test_missing(self):
+        self.assertEqual(check("missing"), (2, "", MISSING))
+
+    def test_directory(self):
+        self.assertEqual(check("."), (2, "", DIRECTORY))
+
+    def test_name_that_commands_a_terminal(self):
+        self.assertEqual(check("\x1b[m\u009b\u202emissing"), (2, "", MISSING.replace("missing", r"\x1b[m\xc2\x9b\xe2\x80\xaemissing", 1)))
+        with tempfile.TemporaryDirectory() as directory:
+            source = pathlib.Path(directory) / "\x1b[31m.cdefsrc"
+            source.write_bytes((CASES / WRONG).read_bytes())
+            self.assertEqual(check(source), (1, "", expected(WRONG, f"{directory}/?[31m.cdefsrc")))
+
+    def test_the_others_are_shown_where_they_stand(self):
+        text = expected(ODD) + MISSING + expected(WRONG) + DIRECTORY
+        self.assertEqual(check(ODD, "missing", WRONG, "."), (2, "", text))
+
+    def test_the_others_are_shown_to_programs(self):
+        status, text, messages = check("--format", "json", WRONG, "missing", RIGHT)
+        self.assertEqual((status, messages), (2, MISSING))
+        self.assertEqual([(each["file"], each["errors"] > 0) for each in json.loads(text)], [(WRONG, True), (RIGHT, False)])
+        status, text, messages = check("--format", "sarif", "missing", WRONG)
+        self.assertEqual((status, messages), (2, MISSING))
+        self.assertTrue(json.loads(text)["runs"][0]["results"])
+
+    def test_wrong_usage(self):
+        for operands in ((), ("--nothing", RIGHT), ("--format", "xml", RIGHT), ("--warn", "nothing", RIGHT)):
+            status, text, messages = check(*operands)
+            self.assertEqual((status, text), (2, ""))
+            self.assertTrue(messages.startswith("cdef: "), messages)
+
+
+class ManyElements(unittest.TestCase):
+    """More of them than the attribute's highest index can count."""
+
+    def test_told_once(self):
+        head, _, tail = (CASES / "index-narrowed.cdefsrc").read_text().partition("PAttrSDDefinition\n")
+        tail = tail[tail.index("ClassToManagerMapping"):]
+        element = "PAttrSDDefinition\n\tElementName={0}\n\tDescription=1\n\tDisplayName=1\n\tElementIndex={0}\n\tDataType=None\n"
+        with tempfile.NamedTemporaryFile("w", suffix=".cdefsrc") as source:
+            source.write(head + "".join(element.format(index) for index in range(65538)) + tail)
+            source.flush()
+            status, text, _ = check("--format", "json", source.name)
+        (only,) = json.loads(text)[0]["findings"]
+        self.assertEqual((status, only["code"], only["source"]), (0, "S508", "\tElementIndex=65536"))
+
+
+class ManyNames(unittest.TestCase):
+    """What is searched for names that are like one is bounded, or the work would be quadratic."""
+
+    def test_searches_end(self):
+        head, _, tail = (CASES / "variable-class-once.cdefsrc").read_text().partition("ResourceVariableClass\n")
+        classes = "ResourceVariableClass\n\tVariableClass=Class{}\n\tObservationInterval=1\n\tReportingInterval=1\n"
+        attribute = tail[tail.index("DynamicResourceAttribute"):].partition("DynamicResourceAttribute\n")[2]
+        attribute = "DynamicResourceAttribute\n" + attribute.partition("DynamicResourceAttribute\n")[0]
+        tail = tail[tail.index("ClassToManagerMapping"):]
+        body = "".join(classes.format(10000 + number) for number in range(1000))
+        for number in range(1200):
+            name = f"Clas{10000 + number}" if number < 1000 else f"Other{number}"
+            body += attribute.replace("Vv", name).replace("Name=A", f"Name={number}").replace("Id=0", f"Id={number}")
+        with tempfile.NamedTemporaryFile("w", suffix=".cdefsrc") as source:
+            source.write(head + body + tail)
+            source.flush()
+            status, text, _ = check("--format", "json", "--no-warn", "narrowed", source.name)
+        findings = json.loads(text)[0]["findings"]
+        self.assertEqual((status, len(findings), {each["code"] for each in findings}), (0, 1200, {"S505"}))
+        self.assertEqual(findings[999]["notes"][0]["message"], "did you mean `Class10999`?")
+        self.assertEqual([each["notes"] for each in findings[1000:]], [[]] * 200)
+
+
+class Editors(unittest.TestCase):
+    """What the files for editors make of messages, with a column and without one."""
+
+    SOURCES = ("keys.cdefsrc", "long-line.cdefsrc", "unknown-attribute.cdefsrc", "numbers.cdefsrc", "repeated.cdefsrc")
+
+    def setUp(self):
+        status, text, self.messages = check("--format", "json", *self.SOURCES)
+        self.assertEqual((status, self.messages), (1, ""))
+        self.findings = [(each["file"], found) for each in json.loads(text) for found in each["findings"]]
+        self.assertIn(None, [found["column"] for _, found in self.findings if found["severity"] == "warning"])
+        _, _, self.messages = check(*self.SOURCES)
+
+    def test_vscode(self):
+        package = json.loads((EDITORS / "vscode/package.json").read_text())
+        (matcher,) = package["contributes"]["problemMatchers"]
+        pattern = matcher["pattern"]
+        matches = [match for line in self.messages.splitlines() if (match := re.match(pattern["regexp"], line))]
+        keys = ("file", "line", "column", "severity")
+        found = [tuple(match[pattern[key]] for key in keys) for match in matches]
+        wanted = [
+            (file, str(each["line"]), each["column"] and str(each["column"]), each["severity"])
+            for file, each in self.findings
+        ]
+        self.assertEqual(found, wanted)
+
+    @unittest.skipUnless(shutil.which("vim"), "there is no vim")
+    def test_vim(self):
+        with tempfile.TemporaryDirectory() as name:
+            directory = pathlib.Path(name)
+            (directory / "messages").write_text(self.messages + "empty.cdefsrc: error: No classes defined [S301]\n")
+            list_all = "map(getqflist(), {_, each -> [bufname(each.bufnr), each.lnum, each.col, each.type, each.valid]})"
+            commands = (f"set rtp^={EDITORS}/vim", "compiler cdef", f"cgetfile {directory}/messages",
+                        f"call writefile([json_encode({list_all})], '{directory}/list')", "qa!")
+            subprocess.run(["vim", "-Nu", "NONE", "-i", "NONE", "-es", *(f"-c{each}" for each in commands)],
+                           stdin=subprocess.DEVNULL, check=True, timeout=60, cwd=CASES)
+            listed = json.loads((directory / "list").read_text())
+        kinds = {"E": "error", "e": "error", "W": "warning", "w": "warning"}
+        found = [(file, line, column, kinds[kind]) for file, line, column, kind, valid in listed if valid and kind in kinds]
+        wanted = [(file, each["line"], each["column"] or 0, each["severity"]) for file, each in self.findings]
+        self.assertEqual(found, wanted + [("empty.cdefsrc", 0, 0, "error")])
+        self.assertEqual(sum(kind in "Nn" and valid for *_, kind, valid in listed), self.messages.count(": note: "))
+
+
+class StandardInput(unittest.TestCase):
+    """Whatever it is, it is read from where it stands."""
+
+    def test_file(self):
+        with open(CASES / WRONG, "rb") as file:
+            self.assertEqual(check("-", stdin=file), (1, "", expected(WRONG, "-")))
+
+    def test_file_that_has_been_read_in_part(self):
+        with tempfile.TemporaryFile() as file:
+            file.write(b"Nonsense\n" + (CASES / WRONG).read_bytes())
+            file.flush()
+            os.lseek(file.fileno(), len(b"Nonsense\n"), os.SEEK_SET)
+            self.assertEqual(check("-", stdin=file), (1, "", expected(WRONG, "-")))
+
+    def test_socket(self):
+        ours, theirs = socket.socketpair()
+        with ours, theirs:
+            ours.sendall((CASES / WRONG).read_bytes())
+            ours.shutdown(socket.SHUT_WR)
+            self.assertEqual(check("-", stdin=theirs), (1, "", expected(WRONG, "-")))
+
+    def test_directory(self):
+        directory = os.open(CASES, os.O_RDONLY)
+        self.addCleanup(os.close, directory)
+        self.assertEqual(check("-", stdin=directory), (2, "", DIRECTORY.replace(".:", "-:")))
+
+
+def main():
+    """Run the tests."""
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--cdef", required=True, type=lambda text: pathlib.Path(text).resolve())
+    parser.parse_args(namespace=OPTIONS)
+    unittest.main(argv=[sys.argv[0]])
+
+
+if __name__ == "__main__":
+    main()

@@ -863,9 +863,9 @@ struct region {
     const struct field *what; /* of the record; null for what is no record */
 };
 
-/* Looks through the whole file once, in time in proportion to its size (each variable ID is looked up in a sorted list);
- * findings in the order length, format, checksum, record sizes, reserved bytes, anchors, sections. Nothing found: the
- * file is sound. */
+/* Looks through the whole file once, in time in proportion to its size (each variable ID is looked up in a sorted
+ * list); findings in the order length, format, checksum, record sizes, reserved bytes, anchors, sections. Nothing
+ * found: the file is sound. */
 std::vector<finding> verify(const database &db);
 
 /* Sound: no errors; there may be warnings. */

@@ -71,7 +71,8 @@ class Bench:
     """The programs, the directory of their inputs, and the rows as they come in."""
 
     def __init__(self, build, example, directory, plan):
-        self.cdgen, self.empty = build / "cdgen", build / "bench" / "bench_empty"
+        self.cdgen, self.cdef = build / "cdgen", build / "cdef"
+        self.empty, self.reader = build / "bench" / "bench_empty", build / "bench" / "bench_read"
         self.launcher = measure.Launcher(build / "bench" / "bench_launch")
         self.example, self.directory, self.plan = example, directory, plan
         self.rows = []
@@ -181,6 +182,33 @@ def memory(peak, output):
     return Verdict(finding, "<= 2.2 x output + 2 MB", peak <= 2.2 * output + 2 * MB)
 
 
+def readers(bench):
+    """What reads databases, against their size: for each byte, less than a nanosecond."""
+    say("verifying and reading")
+    source = bench.source(MIXED, bench.plan.large)
+    size = bench.output_size(source)
+    (bench.directory / "out.cdef").rename(bench.directory / "read.cdef")
+    jobs = {"cdef verify": bench.here([bench.cdef, "verify", "-q", "read.cdef"]),
+            "reading all of it": bench.here([bench.reader, "read.cdef"])}
+    for name, runs in bench.launcher.rounds(jobs, bench.plan.rounds).items():
+        cost = measure.median(runs)
+        bench.add(f"{name}, a database of {bench.plan.large:,} attributes", size, cost,
+                  verdict=at_least(size / cost.cpu / 1e9, 1, "{:.2f} GB/s"))
+
+
+def checks(bench):
+    """cdef check against compiling, dimension by dimension."""
+    say("checking")
+    for dimension in (MIXED, "actions", "SD elements of one run"):
+        source = bench.source(dimension, bench.plan.large)
+        jobs = {"compile": bench.job(source),
+                "check": bench.here([bench.cdef, "check", "--no-warn", "all", source])}
+        compiled, checked = (measure.median(runs)
+                             for runs in bench.launcher.rounds(jobs, bench.plan.rounds).values())
+        bench.add(f"cdef check, {bench.plan.large:,} {dimension}", source.stat().st_size, checked,
+                  verdict=at_most(checked.cpu / compiled.cpu, 2, "{:.2f} x compiling"))
+
+
 def start_up(bench):
     """A small compilation against a program that does nothing."""
     say("start-up")
@@ -281,6 +309,8 @@ def run(bench):
     """Everything; the costs that ratios refer to."""
     costs, sizes = throughput(bench)
     judge_throughput(bench, costs, sizes)
+    readers(bench)
+    checks(bench)
     start_up(bench)
     growth(bench)
     return costs

@@ -6,6 +6,7 @@
 
 #include <cerrno>
 #include <cstdio>
+#include <filesystem>
 #include <memory>
 
 namespace cdb {
@@ -44,21 +45,29 @@ database::database(std::span<const std::byte> file) {
     head.cdb_hdr_checksum = all.number<std::uint32_t>(offsetof(orb_cdb_header_t, cdb_hdr_checksum));
 }
 
+/* In one piece if the file tells its size, which keeps the system from moving it about; but its end decides. */
+static std::vector<std::byte> read_all(std::FILE *file, std::size_t expected) {
+    std::vector<std::byte> contents(expected + 1);
+    for (std::size_t size = 0;;) {
+        size += std::fread(contents.data() + size, 1, contents.size() - size, file);
+        bool ended = size < contents.size();
+        contents.resize(ended ? size : 2 * size);
+        if (ended)
+            return contents;
+    }
+}
+
 std::vector<std::byte> read_file(const char *path, std::error_code &error) {
     constexpr std::size_t STEP = 65536;
     error.clear();
-    std::vector<std::byte> contents;
     std::unique_ptr<std::FILE, close_file> file(std::fopen(path, "rb"));
     if (file == nullptr) {
         error = system_error();
-        return contents;
+        return {};
     }
-    for (std::size_t got = STEP; got == STEP;) {
-        std::size_t size = contents.size();
-        contents.resize(size + STEP);
-        got = std::fread(contents.data() + size, 1, STEP, file.get());
-        contents.resize(size + got);
-    }
+    std::error_code unknown;
+    auto told = std::filesystem::file_size(path, unknown);
+    std::vector<std::byte> contents = read_all(file.get(), unknown ? STEP : static_cast<std::size_t>(told));
     if (std::ferror(file.get()) != 0) {
         error = system_error();
         contents.clear();

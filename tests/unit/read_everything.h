@@ -6,7 +6,8 @@
 
 #include <bit>
 #include <cstdint>
-#include <numeric>
+#include <cstring>
+#include <span>
 #include <string_view>
 
 namespace reading {
@@ -104,20 +105,26 @@ private:
     void read_itself(const cdb::value &v) {
         add(v.type(), v.present(), v.place().value_or(0), v.integer(), v.natural(), v.text());
         add(std::bit_cast<std::uint64_t>(v.real()), v.handle(), v.elements().size());
-        for (std::byte b : v.binary())
-            add(std::to_integer<unsigned>(b));
+        add_bytes(v.binary());
     }
 
     template <class... Things> void add(const Things &...things) {
         (add_one(things), ...);
     }
     void add_one(std::string_view text) {
-        for (char c : text)
-            add_one(static_cast<unsigned char>(c));
+        add_bytes(std::as_bytes(std::span(text)));
     }
-    /* Numbers, and records byte by byte. */
     template <class Thing> void add_one(const Thing &thing) {
-        for (std::byte b : std::as_bytes(std::span(&thing, 1)))
+        add_bytes(std::as_bytes(std::span(&thing, 1)));
+    }
+    /* By words as long as there are some: adding up must not take longer than reading. */
+    void add_bytes(std::span<const std::byte> raw) {
+        std::uint64_t word = 0;
+        for (; raw.size() >= sizeof word; raw = raw.subspan(sizeof word)) {
+            std::memcpy(&word, raw.data(), sizeof word);
+            sum = std::rotl(sum, 5) + word;
+        }
+        for (std::byte b : raw)
             sum = std::rotl(sum, 5) + std::to_integer<unsigned>(b);
     }
 

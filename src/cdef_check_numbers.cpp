@@ -41,6 +41,13 @@ struct number {
 
 namespace {
 
+/* Nothing but digits, no octal ones, and too few of them to be too large: as nearly all numbers are. */
+bool is_plain(std::string_view text, int bits) {
+    size_t safe_digits = bits == 16 ? 4 : 9;
+    return !text.empty() && text.size() <= safe_digits && (text[0] != '0' || text.size() == 1) &&
+           std::all_of(text.begin(), text.end(), [](char c) { return c >= '0' && c <= '9'; });
+}
+
 /* Low and high of "low,high", with the offset of the second; both are the whole text if there is no comma. */
 struct pair_of_texts {
     explicit pair_of_texts(std::string_view text) : low(text), high(text) {
@@ -72,6 +79,8 @@ void session::watch_rest(const number &n, const place &at) {
 
 /* A number16 or number32, or one part of it. */
 void session::watch_number(std::string_view text, size_t offset, int bits) {
+    if (is_plain(text, bits))
+        return;
     number n(text, 0);
     place at = value_part(offset, text.size());
     long limit = (1L << bits) - 1;
@@ -88,10 +97,7 @@ void session::watch_number(std::string_view text, size_t offset, int bits) {
 
 /* A number of an unsigned type, of which only the low bits are stored, and what is below 0 as its complement. */
 void session::watch_unsigned(std::string_view text, size_t offset, vx_data_type_t type) {
-    constexpr size_t SAFE_DIGITS = 9;
-    bool plain = text.size() <= SAFE_DIGITS &&
-                 std::all_of(text.begin(), text.end(), [](char c) { return c >= '0' && c <= '9'; });
-    if (plain)
+    if (is_plain(text, 32))
         return;
     vx_uint64_t value = std::strtoull(std::string(text).c_str(), nullptr, 10);
     vx_uint64_t stored = type == VX_UINT32 ? static_cast<vx_uint32_t>(value) : value;

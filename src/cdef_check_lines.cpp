@@ -3,54 +3,53 @@
 #include "cdef_check_session.h"
 
 #include <algorithm>
+#include <utility>
 
 namespace cdef::check {
 
-static unsigned tag_of(size_t hash) {
-    return static_cast<unsigned>(hash >> 32);
-}
-
-size_t first_lines::slot_of(std::string_view text, size_t hash) const {
+size_t first_lines::slot_of(std::string_view text, unsigned tag) const {
     size_t mask = slots.size() - 1;
-    size_t at = hash & mask;
+    size_t at = tag & mask;
     for (; slots[at].position != 0; at = (at + 1) & mask)
-        if (slots[at].tag == tag_of(hash) && text_of(entries[slots[at].position - 1]) == text)
+        if (slots[at].tag == tag && text_of(slots[at].position) == text)
             break;
     return at;
 }
 
 void first_lines::grow() {
     constexpr size_t FEWEST = 64;
-    size_t size = std::max(FEWEST, 2 * slots.size());
-    slots.assign(size, {0, 0});
-    for (size_t i = 0; i < entries.size(); ++i) {
-        size_t at = entries[i].hash & (size - 1);
-        while (slots[at].position != 0)
-            at = (at + 1) & (size - 1);
-        slots[at] = {tag_of(entries[i].hash), static_cast<unsigned>(i + 1)};
+    std::vector<slot> old(std::max(FEWEST, 2 * slots.size()), slot{0, 0});
+    std::swap(old, slots);
+    size_t mask = slots.size() - 1;
+    for (const slot &each : old) {
+        size_t at = each.tag & mask;
+        while (each.position != 0 && slots[at].position != 0)
+            at = (at + 1) & mask;
+        if (each.position != 0)
+            slots[at] = each;
     }
 }
 
-int &first_lines::of(std::string_view text, size_t hash) {
+int &first_lines::of(std::string_view text, unsigned tag) {
     if (2 * entries.size() >= slots.size())
         grow();
-    slot &found = slots[slot_of(text, hash)];
+    slot &found = slots[slot_of(text, tag)];
     if (found.position == 0) {
-        entries.push_back({hash, texts.size(), text.size(), 0});
+        entries.push_back({texts.size(), 0});
         texts += text;
-        found = {tag_of(hash), static_cast<unsigned>(entries.size())};
+        found = {tag, static_cast<unsigned>(entries.size())};
     }
     return entries[found.position - 1].line;
 }
 
 bool first_lines::has(std::string_view text) const {
-    return !slots.empty() && slots[slot_of(text, std::hash<std::string_view>()(text))].position != 0;
+    return !slots.empty() && slots[slot_of(text, tag_of(text))].position != 0;
 }
 
 name_list first_lines::all() const {
     name_list names;
-    for (const entry &each : entries)
-        names.push_back(text_of(each));
+    for (size_t position = 1; position <= entries.size(); ++position)
+        names.push_back(text_of(position));
     return names;
 }
 

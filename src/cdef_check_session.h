@@ -42,11 +42,11 @@ class first_lines {
 public:
     /* The line for a text, which is 0 if it is a new one. */
     int &of(std::string_view text) {
-        return of(text, std::hash<std::string_view>()(text));
+        return of(text, tag_of(text));
     }
-    /* A number, whose hash is itself: they mostly ascend, and so stay close together. */
+    /* A number, whose tag is itself: they mostly ascend, and so stay close together. */
     int &of(vx_uint32_t number) {
-        return of({reinterpret_cast<const char *>(&number), sizeof number}, number | size_t{number} << 32);
+        return of({reinterpret_cast<const char *>(&number), sizeof number}, number);
     }
     bool has(std::string_view text) const;
     /* All texts; they stay as long as none is added. */
@@ -55,25 +55,27 @@ public:
 
 private:
     struct entry {
-        size_t hash;
-        size_t begin;
-        size_t length;
+        size_t begin; /* in texts; it ends where the next one begins */
         int line;
     };
+    struct slot {
+        unsigned tag;      /* tells the slot's place, and that most other texts need no look at their entries */
+        unsigned position; /* in entries, from 1; 0 is free */
+    };
 
-    int &of(std::string_view text, size_t hash);
-    size_t slot_of(std::string_view text, size_t hash) const;
+    static unsigned tag_of(std::string_view text) {
+        return static_cast<unsigned>(std::hash<std::string_view>()(text) >> 32);
+    }
+    int &of(std::string_view text, unsigned tag);
+    size_t slot_of(std::string_view text, unsigned tag) const;
     void grow();
-    std::string_view text_of(const entry &each) const {
-        return std::string_view(texts).substr(each.begin, each.length);
+    std::string_view text_of(size_t position) const {
+        size_t end = position < entries.size() ? entries[position].begin : texts.size();
+        return std::string_view(texts).substr(0, end).substr(entries[position - 1].begin);
     }
 
     std::string texts;
     std::vector<entry> entries;
-    struct slot {
-        unsigned tag;      /* of the hash: most others are passed over without a look at the entry */
-        unsigned position; /* in entries, from 1; 0 is free */
-    };
     std::vector<slot> slots;
 };
 

@@ -16,7 +16,6 @@ all that is gone change places.
 Everything else is a check in this file, by name.
 """
 
-import argparse
 import itertools
 import json
 import os
@@ -24,6 +23,8 @@ import pathlib
 import subprocess
 import sys
 import tempfile
+
+import cdef_cases
 
 TESTS = pathlib.Path(__file__).parent
 sys.path.insert(0, str(TESTS / "image"))
@@ -433,26 +434,5 @@ def names():
     return [path.stem for path in sorted(CASES.glob("*.case"))] + [check.__name__ for check in CHECKS]
 
 
-def main():
-    """Run the named ones, or all, and print the count; without programs, print the names."""
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--cdgen", type=pathlib.Path)
-    parser.add_argument("--cdef", type=pathlib.Path)
-    parser.add_argument("names", nargs="*")
-    options = parser.parse_args()
-    if options.cdgen is None or options.cdef is None:
-        print("\n".join(names()))
-        return 0
-    options.cdgen, options.cdef = options.cdgen.resolve(), options.cdef.resolve()
-    failed = 0
-    for name in options.names or names():
-        problems = run(name, options)
-        failed += bool(problems)
-        if problems:
-            print(f"FAIL {name}", *problems, sep="\n    ")
-    print(f"{len(options.names or names()) - failed} passed, {failed} failed")
-    return 1 if failed else 0
-
-
 if __name__ == "__main__":
-    sys.exit(main())
+    sys.exit(cdef_cases.main(__doc__.splitlines()[0], names, run))

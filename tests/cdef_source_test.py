@@ -10,7 +10,6 @@ source.  That holds for every golden source, the twins, the examples, and for
 generated sources, in both byte orders.
 """
 
-import argparse
 import os
 import pathlib
 import pty
@@ -19,6 +18,7 @@ import sys
 import tempfile
 
 import cdb_image
+import cdef_cases
 import cdef_sources
 import golden
 
@@ -232,27 +232,11 @@ def names():
     return [*sorted(path.stem for path in CASES.iterdir() if path.suffix in suffixes), *PROPERTIES]
 
 
-def main():
-    """Run the named ones, or all, and print the count; without programs, print the names."""
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--cdgen", type=pathlib.Path)
-    parser.add_argument("--cdef", type=pathlib.Path)
-    parser.add_argument("names", nargs="*")
-    options = parser.parse_args()
-    if options.cdgen is None or options.cdef is None:
-        print("\n".join(names()))
-        return 0
-    options.cdgen, options.cdef = options.cdgen.resolve(), options.cdef.resolve()
+def run(name, options):
+    """The problems of one case or property."""
     programs = Programs(options)
-    failed = 0
-    for name in options.names or names():
-        problems = PROPERTIES[name](programs) if name in PROPERTIES else check_case(programs, CASES / f"{name}.x")
-        failed += bool(problems)
-        if problems:
-            print(f"FAIL {name}", *problems, sep="\n    ")
-    print(f"{len(options.names or names()) - failed} passed, {failed} failed")
-    return 1 if failed else 0
+    return PROPERTIES[name](programs) if name in PROPERTIES else check_case(programs, CASES / f"{name}.x")
 
 
 if __name__ == "__main__":
-    sys.exit(main())
+    sys.exit(cdef_cases.main(__doc__.splitlines()[0], names, run))

@@ -2,6 +2,8 @@
 
 #include "cdb_walk.h"
 
+#include <functional>
+#include <numeric>
 #include <utility>
 
 namespace cdb {
@@ -47,35 +49,53 @@ const spot whole_file = {.section = std::nullopt, .record = "orb_cdb_header_t"};
 /* ---- Things that references lead to ---------------------------------------------------------------------------- */
 
 extent::extent(const bytes &covered, std::size_t file_offset)
-    : area(covered), offset(file_offset), taken(units(covered.size())), text_starts(units(covered.size())),
-      texts_end(covered.size()) {
+    : area(covered), offset(file_offset), texts_end(covered.size()), marks(units(covered.size())) {
     while (texts_end > 0 && area.raw()[texts_end - 1] != std::byte{0})
         --texts_end;
 }
 
 extent::claim_result extent::claim(std::size_t at, std::size_t length) {
     std::size_t first = at / UNIT;
-    auto owner = static_cast<std::uint32_t>(first + 1);
+    std::uint8_t mark = TAKEN | BEGINS;
     for (std::size_t unit = first; unit < first + units(length); ++unit) {
-        if (taken[unit] != 0)
-            return unit == first && taken[unit] == owner ? claim_result::AGAIN : claim_result::OVERLAPS;
-        taken[unit] = owner;
+        if ((marks[unit] & TAKEN) != 0)
+            return unit == first && (marks[unit] & BEGINS) != 0 ? claim_result::AGAIN : claim_result::OVERLAPS;
+        marks[unit] |= mark;
+        mark = TAKEN;
     }
     return claim_result::FIRST;
 }
 
+/* Whether one of eight bytes is zero: only for it does taking 1 away carry into a highest bit that was not set. */
+static bool has_zero(const std::byte *unit) {
+    constexpr std::uint64_t ONES = 0x0101010101010101;
+    std::uint64_t word = 0;
+    static_assert(sizeof word == extent::UNIT);
+    std::memcpy(&word, unit, sizeof word);
+    return ((word - ONES) & ~word & (ONES << 7)) != 0;
+}
+
 extent::text_claim extent::claim_text(std::size_t at, std::size_t end) {
-    auto owner = static_cast<std::uint32_t>(at / UNIT + 1);
+    std::uint8_t mark = TAKEN | BEGINS;
     for (std::size_t place = at; place < end; place += UNIT) {
         if (is_taken(place))
             return {place - at, false};
-        taken[place / UNIT] = owner;
+        marks[place / UNIT] |= mark;
+        mark = TAKEN;
         std::size_t size = std::min(UNIT, end - place);
+        if (size == UNIT && !has_zero(area.raw().data() + place))
+            continue;
         std::size_t length = area.part(place, size).text(std::size_t{0}).size();
         if (length < size)
             return {place + length + 1 - at, true};
     }
     return {end - at, false};
+}
+
+std::size_t extent::next_text(std::size_t at) const {
+    auto from = marks.begin() + static_cast<std::ptrdiff_t>(units(at));
+    auto found = std::find_if(from, marks.end(), [](std::uint8_t mark) { return (mark & TEXT) != 0; });
+    return std::min(static_cast<std::size_t>(found - marks.begin()) * UNIT, area.size());
 }
 
 /* ---- Saying what was seen -------------------------------------------------------------------------------------- */
@@ -93,25 +113,15 @@ void walker::report(check broken, const spot &at, std::string_view field, std::s
     report(broken, at, field, offset, std::to_string(found), std::to_string(expected));
 }
 
-void walker::add_region(const spot &at, std::size_t offset, std::size_t size, std::string_view name,
-                        const field *what) {
-    if (regions != nullptr && size > 0)
-        regions->push_back({offset, size, at.section, name, at.index, what});
+void walker::report_id(const spot &at, std::string_view field, vx_uint32_t found, vx_uint32_t expected) {
+    report(check::RECORD_ID, at, field, at.offset, hex(found), hex(expected));
 }
 
-void walker::expect_id(const spot &at, std::string_view field, vx_uint32_t found, vx_uint32_t expected) {
-    if (found != expected)
-        report(check::RECORD_ID, at, field, at.offset, hex(found), hex(expected));
-}
-
-void walker::expect_zero(const spot &at, std::string_view field, const bytes &area, std::size_t offset,
-                         std::size_t length) {
-    auto raw = area.part(offset, length).raw();
-    auto wrong = std::find_if(raw.begin(), raw.end(), [](std::byte b) { return b != std::byte{0}; });
-    if (wrong == raw.end())
-        return;
-    auto distance = static_cast<std::size_t>(wrong - raw.begin());
-    report(check::RESERVED, at, field, at.offset + distance, hex(std::to_integer<unsigned>(*wrong)), "0x0");
+void walker::report_reserved(const spot &at, std::string_view field, std::span<const std::byte> stretch,
+                             std::size_t file_offset) {
+    auto wrong = std::find_if(stretch.begin(), stretch.end(), [](std::byte b) { return b != std::byte{0}; });
+    auto distance = static_cast<std::size_t>(wrong - stretch.begin());
+    report(check::RESERVED, at, field, file_offset + distance, hex(std::to_integer<unsigned>(*wrong)), "0x0");
 }
 
 void walker::add_regions(const spot &at, const bytes &area, std::size_t offset, std::span<const field> fields) {
@@ -138,7 +148,7 @@ void walker::visit_text(const spot &at, const field &ref, std::uint32_t offset, 
                "a text in " + std::to_string(strings.area.size()) + " bytes");
     else if (offset == 0 && (!is_name(ref) || may_be_unset))
         strings.first_text_asked_for = true;
-    else if (strings.text_starts[offset / extent::UNIT])
+    else if (strings.is_text(offset))
         report(check::VALUE_SHARED, at, ref.name, place, std::to_string(offset), "a text of its own");
     else
         note_text(at, strings, offset);
@@ -146,45 +156,35 @@ void walker::visit_text(const spot &at, const field &ref, std::uint32_t offset, 
 
 /* Where texts end, they tell themselves; where they may end, the next one tells: it is to be known first. What is
  * excused comes last, and may begin amid something else. */
-void walker::note_text(spot at, extent &strings, std::size_t offset) {
-    at.record = "text";
-    at.index = 0;
+void walker::note_text(const spot &at, extent &strings, std::size_t offset) {
     if (excuse)
         walk_text(at, strings, offset, strings.area.size());
     else
-        strings.text_starts[offset / extent::UNIT] = true;
+        strings.note_text(offset);
 }
 
 /* One text, which reaches to the place end at the most: there the next text begins, or the table ends. */
-void walker::walk_text(const spot &at, extent &strings, std::size_t start, std::size_t end) {
-    std::size_t file_offset = strings.offset + start;
+void walker::walk_text(const spot &in, extent &strings, std::size_t start, std::size_t end) {
     auto [size, whole] = strings.claim_text(start, end);
-    add_region(at, file_offset, size, "text");
+    spot text = {in.section, "text", 0, strings.offset + start};
+    add_region(text, text.offset, size, text.record);
     if (!whole)
-        return report(check::VALUE_SHARED, at, {}, file_offset, "a text that runs into something else",
+        return report(check::VALUE_SHARED, text, {}, text.offset, "a text that runs into something else",
                       "a place of its own");
-    std::size_t filling = start + size;
-    std::size_t filled = std::min(end, extent::units(filling) * extent::UNIT);
-    spot place = at;
-    place.offset = strings.offset + filling;
-    expect_zero(place, "filling", strings.area, filling, filled - filling);
-    add_region(at, place.offset, filled - filling, "filling");
+    std::size_t filled = std::min(end, extent::units(start + size) * extent::UNIT);
+    std::size_t filling = filled - start - size;
+    expect_zero(text, "filling", strings.area, start + size, filling, text.offset + size);
+    add_region(text, text.offset + size, filling, "filling");
 }
 
-void walker::finish_texts(spot at, extent &strings) {
-    at.record = "text";
-    at.index = 0;
+void walker::finish_texts(const spot &at, extent &strings) {
     if (strings.first_text_asked_for)
-        strings.text_starts[0] = true;
-    std::optional<std::size_t> start;
-    for (std::size_t unit = 0; unit < strings.text_starts.size(); ++unit)
-        if (strings.text_starts[unit]) {
-            if (start)
-                walk_text(at, strings, *start, unit * extent::UNIT);
-            start = unit * extent::UNIT;
-        }
-    if (start)
-        walk_text(at, strings, *start, strings.area.size());
+        strings.note_text(0);
+    for (std::size_t start = strings.next_text(0); start < strings.area.size();) {
+        std::size_t next = strings.next_text(start + 1);
+        walk_text(at, strings, start, next);
+        start = next;
+    }
 }
 
 /* ---- The file as a whole --------------------------------------------------------------------------------------- */
@@ -199,7 +199,7 @@ void walker::check_length() {
                hex(db.header().cdb_hdr_format), hex(CDB_FORMAT));
 }
 
-/* XORing words depends neither on their order nor on that of their bytes: it is done two words at a time, and the
+/* XORing words depends neither on their order nor on that of their bytes: it is done eight words at a time, and the
  * result is turned. */
 void walker::check_checksum() {
     constexpr std::size_t FIRST = offsetof(orb_cdb_header_t, cdb_hdr_format);
@@ -207,19 +207,20 @@ void walker::check_checksum() {
     auto raw = db.file().raw();
     std::size_t length = std::min<std::size_t>(db.header().cdb_hdr_length, raw.size() - WORD);
     std::size_t words = length < WORD ? 0 : (length - WORD) / WORD;
-    std::array<std::uint32_t, 2> sum = {};
-    std::memcpy(sum.data(), raw.data(), WORD);
-    for (std::size_t i = 0; i < words / 2; ++i) {
-        std::array<std::uint32_t, 2> pair;
-        std::memcpy(pair.data(), raw.data() + FIRST + i * sizeof pair, sizeof pair);
-        sum[0] ^= pair[0];
-        sum[1] ^= pair[1];
-    }
-    std::uint32_t odd_one = 0;
-    if (words % 2 != 0)
-        std::memcpy(&odd_one, raw.data() + FIRST + (words - 1) * WORD, WORD);
-    sum[0] ^= sum[1] ^ odd_one;
-    auto turned = bytes(std::as_bytes(std::span(sum)), db.order()).number<std::uint32_t>(0);
+    std::array<std::uint32_t, 8> sums = {}, some = {};
+    auto add = [&](const std::byte *from, std::size_t size) {
+        std::memcpy(some.data(), from, size);
+        for (std::size_t i = 0; i < some.size(); ++i)
+            sums[i] ^= some[i];
+    };
+    add(raw.data(), WORD);
+    auto left = raw.subspan(FIRST, words * WORD);
+    for (; left.size() >= sizeof some; left = left.subspan(sizeof some))
+        add(left.data(), sizeof some);
+    some = {};
+    add(left.data(), left.size());
+    std::uint32_t sum = std::accumulate(sums.begin(), sums.end(), std::uint32_t{0}, std::bit_xor());
+    auto turned = bytes(std::as_bytes(std::span(&sum, 1)), db.order()).number<std::uint32_t>(0);
     if (turned != db.header().cdb_hdr_checksum)
         report(check::CHECKSUM, whole_file, "cdb_hdr_checksum", offsetof(orb_cdb_header_t, cdb_hdr_checksum),
                hex(db.header().cdb_hdr_checksum), hex(turned));
@@ -416,7 +417,7 @@ void walker::walk_variable_ids(const spot &record_at, const bytes &section, std:
     }
     std::size_t end = first + count * sizeof(var_id_t);
     std::size_t filling = std::min(section.size(), first + length) - std::min(section.size(), end);
-    expect_zero(at, "filling", section, end, filling);
+    expect_zero(at, "filling", section, end, filling, at.offset);
     add_region(at, at.offset, filling, "filling");
 }
 

@@ -89,6 +89,13 @@ struct spot {
     std::size_t offset = 0; /* of the record, in the file */
 };
 
+inline bool all_zero(std::span<const std::byte> stretch) {
+    std::uint64_t word = 0;
+    for (; stretch.size() >= sizeof word && word == 0; stretch = stretch.subspan(sizeof word))
+        std::memcpy(&word, stretch.data(), sizeof word);
+    return word == 0 && std::all_of(stretch.begin(), stretch.end(), [](std::byte b) { return b == std::byte{0}; });
+}
+
 /* A stretch in which things stand that references lead to: each belongs to one owner. */
 class extent {
 public:
@@ -115,23 +122,34 @@ public:
 
     /* at < area.size() */
     bool is_taken(std::size_t at) const {
-        return taken[at / UNIT] != 0;
+        return (marks[at / UNIT] & TAKEN) != 0;
     }
+
+    /* Texts that are known to begin at a place, a multiple of UNIT, and are not claimed yet. */
+    void note_text(std::size_t at) {
+        marks[at / UNIT] |= TEXT;
+    }
+    bool is_text(std::size_t at) const {
+        return (marks[at / UNIT] & TEXT) != 0;
+    }
+    /* Where the first of them begins from at on; the size of the area if there is none. */
+    std::size_t next_text(std::size_t at) const;
 
     static constexpr std::size_t units(std::size_t size) {
         return (size + UNIT - 1) / UNIT;
     }
 
     bytes area;
-    std::size_t offset; /* of the area in the file */
-
-private:
-    std::vector<std::uint32_t> taken; /* by unit: the unit, counted from 1, at which what covers it begins; 0: free */
-
-public:
-    std::vector<bool> text_starts;     /* by unit: a text begins there */
+    std::size_t offset;                /* of the area in the file */
     bool first_text_asked_for = false; /* by a reference that may as well mean that there is none */
     std::size_t texts_end;             /* behind the last zero byte: a text that begins before it ends */
+
+private:
+    static constexpr std::uint8_t TAKEN = 1;  /* something has claimed the unit, */
+    static constexpr std::uint8_t BEGINS = 2; /* and begins there */
+    static constexpr std::uint8_t TEXT = 4;   /* a text has been noted there */
+
+    std::vector<std::uint8_t> marks; /* by unit */
 };
 
 class walker {
@@ -149,27 +167,37 @@ public:
     void report(check broken, const spot &at, std::string_view field, std::size_t offset, std::uint64_t found,
                 std::uint64_t expected);
     void add_region(const spot &at, std::size_t offset, std::size_t size, std::string_view name,
-                    const field *what = nullptr);
+                    const field *what = nullptr) {
+        if (regions != nullptr && size > 0)
+            regions->push_back({offset, size, at.section, name, at.index, what});
+    }
 
     /* -- records of any kind -- */
 
     /* The regions of a record's fields, and whether its reserved ones are zero. Lists' entries are not part of it. */
     template <class Record> void visit(const spot &at, const bytes &area, std::size_t offset) {
         for (const field &f : reserved_fields_of<Record>)
-            expect_reserved(at, area, offset, f);
+            expect_zero(at, f.name, area, offset + f.offset, std::size_t{f.width} * f.count, at.offset + f.offset);
         if (regions != nullptr)
             add_regions(at, area, offset, fields_of<Record>);
     }
-    void expect_id(const spot &at, std::string_view field, vx_uint32_t found, vx_uint32_t expected);
-    /* Whether the bytes are all zero; reports if not. */
-    void expect_zero(const spot &at, std::string_view field, const bytes &area, std::size_t offset, std::size_t length);
+    void expect_id(const spot &at, std::string_view field, vx_uint32_t found, vx_uint32_t expected) {
+        if (found != expected)
+            report_id(at, field, found, expected);
+    }
+    /* Reports the first of the bytes that is not zero, if there is one. file_offset: of the bytes. */
+    void expect_zero(const spot &at, std::string_view field, const bytes &area, std::size_t offset, std::size_t length,
+                     std::size_t file_offset) {
+        if (auto stretch = area.part(offset, length).raw(); !all_zero(stretch))
+            report_reserved(at, field, stretch, file_offset);
+    }
 
     /* The text that a record's reference leads to. */
     void visit_text(const spot &at, const field &ref, std::uint32_t offset, extent &strings);
     /* A text at offset, which is inside of the strings and a multiple of extent::UNIT. */
-    void note_text(spot at, extent &strings, std::size_t offset);
+    void note_text(const spot &at, extent &strings, std::size_t offset);
     /* Regions of texts and their filling, once all texts are known. */
-    void finish_texts(spot at, extent &strings);
+    void finish_texts(const spot &at, extent &strings);
 
     /* A dynamic attribute that the variable classes behind its class may refer to. */
     void note_dynamic_id(std::int32_t id, bool of_class);
@@ -184,11 +212,9 @@ public:
     bool may_be_unset = true;
 
 private:
-    void expect_reserved(const spot &at, const bytes &area, std::size_t offset, const field &f) {
-        spot place = at;
-        place.offset += f.offset;
-        expect_zero(place, f.name, area, offset + f.offset, std::size_t{f.width} * f.count);
-    }
+    void report_id(const spot &at, std::string_view field, vx_uint32_t found, vx_uint32_t expected);
+    void report_reserved(const spot &at, std::string_view field, std::span<const std::byte> stretch,
+                         std::size_t file_offset);
     void add_regions(const spot &at, const bytes &area, std::size_t offset, std::span<const field> fields);
     bool walk_header();
     void check_length();
@@ -205,7 +231,7 @@ private:
     void walk_variable_class(spot at, const bytes &section);
     void walk_variable_ids(const spot &at, const bytes &section, std::size_t first, std::size_t count);
     void walk_class_hash(spot at, const bytes &section);
-    void walk_text(const spot &at, extent &strings, std::size_t start, std::size_t end);
+    void walk_text(const spot &in, extent &strings, std::size_t start, std::size_t end);
     void expect_rounded(const spot &at, const bytes &section, std::size_t strings_at);
     void find_last_class();
 

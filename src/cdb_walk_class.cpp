@@ -140,13 +140,13 @@ void class_walk::follow_attribute(const spot &place, std::size_t offset, vx_uint
     walk.may_be_unset = may_be_cut_short;
     bool may_be_astray = id == CDB_ID_DATTR && is_out_of_line(type);
     for (const field &f : leading_fields_of<Record>) {
-        doubtful d = {place, &f, section.number<std::uint32_t>(offset + f.offset), type};
-        if (may_be_cut_short && f.to == target::valid_vals && d.word == 0)
-            doubtful_lists.push_back(d);
+        auto word = section.number<std::uint32_t>(offset + f.offset);
+        if (may_be_cut_short && f.to == target::valid_vals && word == 0)
+            doubtful_lists.push_back({place, &f, word, type});
         else if (may_be_astray && is_bound(f))
-            doubtful_bounds.push_back(d);
+            doubtful_bounds.push_back({place, &f, word, type});
         else
-            follow_field(place, f, d.word, type);
+            follow_field(place, f, word, type);
     }
 }
 
@@ -302,7 +302,7 @@ std::optional<std::size_t> class_walk::claim_list(const spot &place, const field
         walk.add_region(list_at, list_at.offset + f.offset, f.width, format.record, &f);
     if (count < held) {
         spot room_at = {at.section, format.record, offset, list_at.offset + LIST_HEAD};
-        walk.expect_zero(room_at, "filling", lists.area, offset + LIST_HEAD, format.entry);
+        walk.expect_zero(room_at, "filling", lists.area, offset + LIST_HEAD, format.entry, room_at.offset);
         walk.add_region(room_at, room_at.offset, format.entry, "filling");
     }
     return offset + LIST_HEAD;

@@ -74,7 +74,7 @@ private:
     void walk_array(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset,
                     vx_data_type_t type);
     void walk_structured_data(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset);
-    void walk_filling(const spot &place, std::size_t offset, std::size_t end);
+    void walk_filling(const spot &place, std::size_t end);
     void report_unreached(extent &lists, std::string_view name);
 
     walker &walk;

@@ -18,7 +18,7 @@ void class_walk::walk_container(const spot &place, std::string_view field, std::
         return walk.report(check::VALUE_UNALIGNED, place, field, file_offset, std::to_string(offset),
                            "a multiple of 8");
     if (type == VX_CHAR_PTR) {
-        if (!walk.excuse && strings.text_starts[offset / extent::UNIT])
+        if (!walk.excuse && strings.is_text(offset))
             return walk.report(check::VALUE_SHARED, place, field, file_offset, std::to_string(offset),
                                "a value of its own");
         walk.note_text(at, strings, offset);
@@ -54,13 +54,11 @@ bool class_walk::claim_value(const spot &place, std::string_view field, std::siz
     return false;
 }
 
-/* From offset to the next multiple of 8, in the strings. */
-void class_walk::walk_filling(const spot &place, std::size_t offset, std::size_t end) {
+/* From a place to the next multiple of 8, in the strings. */
+void class_walk::walk_filling(const spot &place, std::size_t end) {
     std::size_t rounded = std::min(extent::units(end) * extent::UNIT, strings.area.size());
-    spot filling = {place.section, place.record, place.index, offset};
-    filling.offset = strings.offset + end;
-    walk.expect_zero(filling, "filling", strings.area, end, rounded - end);
-    walk.add_region(filling, filling.offset, rounded - end, "filling");
+    walk.expect_zero(place, "filling", strings.area, end, rounded - end, strings.offset + end);
+    walk.add_region(place, strings.offset + end, rounded - end, "filling");
 }
 
 /* The length and the bytes are two pieces. */
@@ -70,9 +68,9 @@ void class_walk::walk_binary(const spot &place, std::string_view field, std::siz
         return;
     spot binary = {at.section, "binary", 0, strings.offset + offset};
     walk.add_region(binary, binary.offset, sizeof(vx_uint32_t), "length");
-    walk_filling(binary, offset, offset + sizeof(vx_uint32_t));
+    walk_filling(binary, offset + sizeof(vx_uint32_t));
     walk.add_region(binary, binary.offset + value::BINARY_BYTES, length, "binary");
-    walk_filling(binary, offset, offset + value::BINARY_BYTES + length);
+    walk_filling(binary, offset + value::BINARY_BYTES + length);
     if (length == 0)
         empty_binaries.push_back(offset + value::BINARY_BYTES);
 }
@@ -94,7 +92,7 @@ void class_walk::walk_handle(const spot &place, std::string_view field, std::siz
         return;
     spot handle = {at.section, "handle", 0, strings.offset + offset};
     walk.add_region(handle, handle.offset, SIZE, "handle");
-    walk_filling(handle, offset, offset + SIZE);
+    walk_filling(handle, offset + SIZE);
 }
 
 void class_walk::walk_array(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset,
@@ -125,7 +123,7 @@ void class_walk::walk_structured_data(const spot &place, std::string_view field,
     walk.visit<vx_structured_data_t>(sd, strings.area, offset);
     spot element = {at.section, "vx_structured_data_element_t", 0, sd.offset + value::ELEMENTS};
     if (count == 0) {
-        walk.expect_zero(element, "filling", strings.area, offset + value::ELEMENTS, SIZE);
+        walk.expect_zero(element, "filling", strings.area, offset + value::ELEMENTS, SIZE, element.offset);
         walk.add_region(element, element.offset, SIZE, "filling");
     }
     for (; element.index < count; ++element.index, element.offset += SIZE) {

@@ -59,33 +59,33 @@ bool is_array(vx_data_type_t type) {
 template <const auto &fields> constexpr auto rows = std::make_index_sequence<std::size(fields)>();
 
 /* Numbers whole, references in their first word; values are turned elsewhere, because their type must be known. */
-[[gnu::always_inline]] inline void swap_field(char *record, const field &f) {
-    bool reference = f.kind == field_kind::reference;
-    if (f.stays || (!reference && f.kind != field_kind::number))
-        return;
-    char *at = record + f.offset;
-    for (size_t i = 0; i < f.count; ++i, at += f.width)
-        swap_any(at, reference ? sizeof(vx_uint32_t) : f.width);
+template <const auto &fields, size_t row> void swap_field(char *record) {
+    constexpr field f = fields[row];
+    constexpr bool reference = f.kind == field_kind::reference;
+    if constexpr (!f.stays && (reference || f.kind == field_kind::number))
+        for (size_t i = 0; i < f.count; ++i)
+            swap_any(record + f.offset + i * f.width, reference ? sizeof(vx_uint32_t) : f.width);
 }
 
 template <const auto &fields> void swap_fields(char *record) {
     [&]<size_t... row>(std::index_sequence<row...>) {
-        (swap_field(record, fields[row]), ...);
+        (swap_field<fields, row>(record), ...);
     }
     (rows<fields>);
 }
 
-[[gnu::always_inline]] inline void swap_value_of(char *record, const field &f, vx_data_type_t owner_type,
-                                                 swap_area &sbase_p) {
-    if (f.kind != field_kind::value)
-        return;
-    bool own = f.type_at != cdb::TYPE_OF_OWNER;
-    swap_value(record + f.offset, own ? load<vx_data_type_t>(record + f.type_at) : owner_type, sbase_p);
+template <const auto &fields, size_t row>
+void swap_value_of(char *record, vx_data_type_t owner_type, swap_area &sbase_p) {
+    constexpr field f = fields[row];
+    if constexpr (f.kind == field_kind::value && f.type_at == cdb::TYPE_OF_OWNER)
+        swap_value(record + f.offset, owner_type, sbase_p);
+    else if constexpr (f.kind == field_kind::value)
+        swap_value(record + f.offset, load<vx_data_type_t>(record + f.type_at), sbase_p);
 }
 
 template <const auto &fields> void swap_values(char *record, vx_data_type_t owner_type, swap_area &sbase_p) {
     [&]<size_t... row>(std::index_sequence<row...>) {
-        (swap_value_of(record, fields[row], owner_type, sbase_p), ...);
+        (swap_value_of<fields, row>(record, owner_type, sbase_p), ...);
     }
     (rows<fields>);
 }
@@ -165,25 +165,23 @@ void follow_sd_def(vx_uint32_t offset, const swap_areas &areas) {
 }
 
 /* What a record refers to in the class's list tables. type: that of the record's values. */
-[[gnu::always_inline]] inline void follow_reference(const char *record, const field &f, vx_data_type_t type,
-                                                    const swap_areas &areas) {
-    bool to_list = f.to == target::variety_lists || f.to == target::valid_vals || f.to == target::sd_defs;
-    if (f.kind != field_kind::reference || !to_list)
-        return;
-    vx_uint32_t offset = load_word(record + f.offset);
+template <const auto &fields, size_t row>
+void follow_reference(const char *record, vx_data_type_t type, const swap_areas &areas) {
+    constexpr field f = fields[row];
+    vx_uint32_t offset = f.kind == field_kind::reference ? load_word(record + f.offset) : CDB_NONE;
     if (offset == CDB_NONE)
         return;
-    if (f.to == target::variety_lists)
+    if constexpr (f.to == target::variety_lists)
         follow_variety_list(offset, areas.vlbase_p);
-    else if (f.to == target::valid_vals)
+    else if constexpr (f.to == target::valid_vals)
         follow_valid_vals(offset, type, areas.vvbase_p, areas.sbase_p);
-    else
+    else if constexpr (f.to == target::sd_defs)
         follow_sd_def(offset, areas);
 }
 
 template <const auto &fields> void follow_references(const char *record, vx_data_type_t type, const swap_areas &areas) {
     [&]<size_t... row>(std::index_sequence<row...>) {
-        (follow_reference(record, fields[row], type, areas), ...);
+        (follow_reference<fields, row>(record, type, areas), ...);
     }
     (rows<fields>);
 }

@@ -122,10 +122,10 @@ private:
         std::uint64_t word = 0;
         for (; raw.size() >= sizeof word; raw = raw.subspan(sizeof word)) {
             std::memcpy(&word, raw.data(), sizeof word);
-            sum = std::rotl(sum, 5) + word;
+            sum += word;
         }
         for (std::byte b : raw)
-            sum = std::rotl(sum, 5) + std::to_integer<unsigned>(b);
+            sum += std::to_integer<unsigned>(b);
     }
 
     bool deep;

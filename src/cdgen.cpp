@@ -150,6 +150,8 @@ constinit const std::span<const closing_step> closing_steps = steps;
 
 cdgen::~cdgen() {
     discard_mapfile(*this);
+    for (tbl_content &content : filed)
+        free(content.tbl_base);
 }
 
 void cdgen_error_exit(cdgen &cx, const char *msg, const char *detail1, const char *detail2, int line, int code) {

@@ -26,11 +26,22 @@ struct cdgen;
 
 /* ---- Staging tables (cdgen_util_tables.cpp) ------------------------------------------------------------------- */
 
+/* What a table holds: all that stays of one to which nothing more is to come. */
+struct tbl_content {
+    size_t used() const {
+        return static_cast<size_t>(tbl_next - tbl_base);
+    }
+
+    char *tbl_base;       /* null until the first reservation */
+    char *tbl_next;       /* first unreserved byte */
+    const char *tbl_name; /* for traces and messages */
+};
+
 /* An append-only arena of zero-filled bytes. Grows by whole allocation units, and so does tbl_size, which the traces
  * show; underneath, memory is taken in larger steps. The block moves when it grows: whatever refers into a table does
  * so by its offset from tbl_base. Once there is a block, tbl_next < tbl_end and all bytes between them are 0. */
-struct tbl {
-    tbl(size_t au, const char *name) : tbl_au(au), tbl_name(name) {}
+struct tbl : tbl_content {
+    tbl(size_t au, const char *name) : tbl_content{nullptr, nullptr, name}, tbl_au(au) {}
     tbl(const tbl &) = delete;
     tbl &operator=(const tbl &) = delete;
     ~tbl();
@@ -38,20 +49,14 @@ struct tbl {
     /* Empty, as if it were new; the block waits for the first reservation. */
     void restart(const char *name);
 
-    size_t used() const {
-        return static_cast<size_t>(tbl_next - tbl_base);
-    }
     size_t room() const {
         return static_cast<size_t>(tbl_end - tbl_next);
     }
 
-    char *tbl_base = nullptr;      /* null until the first reservation */
     char *tbl_prev_base = nullptr; /* the block before its latest move; for diagnosis */
-    char *tbl_next = nullptr;      /* first unreserved byte */
     size_t tbl_size = 0;           /* bytes, a multiple of tbl_au */
     char *tbl_end = nullptr;       /* tbl_base + tbl_size */
     size_t tbl_au;                 /* bytes: the first block and the granule of every growth */
-    const char *tbl_name;          /* for traces and messages */
     size_t tbl_capacity = 0;       /* bytes really held, at least tbl_size */
     char *tbl_spare = nullptr;     /* the block before the first reservation, if there is one already */
 };
@@ -66,15 +71,19 @@ constexpr size_t round8(size_t n) {
 /* Zero-filled memory, to be given back with free(). Failing is fatal, with errno as the status. */
 void *cfg_malloc(cdgen &cx, size_t s);
 
-/* A new, empty table that lives as long as the context. */
+/* A new, empty table that stays until it is filed, or as long as the context. */
 tbl *make_tbl(cdgen &cx, size_t au, const char *name);
 
 /* Reserves s bytes, zeroed, at the end of t. The address holds until the next reservation in t. */
 void *alloc_tble(cdgen &cx, tbl *t, size_t s);
 
-/* Gives back what a table does not use, down to tbl_next, once nothing more is to come: with many classes the rest of
- * their blocks would be most of the memory. */
+/* Gives back what a table does not use, down to tbl_next. */
 void trim_tbl(tbl *t);
+
+/* Keeps of the table that a staged record refers to only what it holds, once nothing more is to come, and lets the
+ * record refer to that; to nothing, if it is empty. With many classes the rest would be most of the memory. The table
+ * itself serves again. */
+void file_tbl(cdgen &cx, cdb_ref_t &ref);
 
 /* Appends len bytes, zero-filled up to a multiple of 8; returns their offset from tbl_base. add_to_tbl is the name that
  * serves for strings and serialised values. */
@@ -86,27 +95,33 @@ void memcpy_8_rounded(char *dst, const char *src, int len);
 
 /* The record at an offset of a staging table, valid until the next reservation in it. An offset that leads out of the
  * used part is a defect of the program and fatal. Offsets of records are multiples of their alignment. */
-void *tbl_at(cdgen &cx, tbl *t, size_t offset, size_t size);
+void *tbl_at(cdgen &cx, tbl_content *t, size_t offset, size_t size);
 
-template <class Record> Record *record_at(cdgen &cx, tbl *t, size_t offset) {
+template <class Record> Record *record_at(cdgen &cx, tbl_content *t, size_t offset) {
     return static_cast<Record *>(tbl_at(cx, t, offset, sizeof(Record)));
 }
 
 /* All records of a table that holds nothing else. */
-template <class Record> std::span<Record> records_of(tbl *t) {
+template <class Record> std::span<Record> records_of(tbl_content *t) {
     if (t == nullptr || t->tbl_base == nullptr)
         return {};
     return {reinterpret_cast<Record *>(t->tbl_base), t->used() / sizeof(Record)};
 }
 
-/* While a record is staged, the reference to a table of its own holds the address of the staging table. */
-inline tbl *staged_tbl(const cdb_ref_t &ref) {
-    tbl *t = nullptr;
+/* While a record is staged, the reference to a table of its own holds the address of what is in the table, which may
+ * have been filed. */
+inline tbl_content *staged_content(const cdb_ref_t &ref) {
+    tbl_content *t = nullptr;
     std::memcpy(&t, ref.pointer, sizeof t);
     return t;
 }
 
-inline void stage_tbl(cdb_ref_t &ref, tbl *t) {
+/* The table itself, while the record is open. */
+inline tbl *staged_tbl(const cdb_ref_t &ref) {
+    return static_cast<tbl *>(staged_content(ref));
+}
+
+inline void stage_tbl(cdb_ref_t &ref, tbl_content *t) {
     ref = {};
     std::memcpy(ref.pointer, &t, sizeof t);
 }
@@ -490,7 +505,10 @@ struct cdgen {
     int rsrc_mgr_count = 0;
     int rsrc_cmmap_count = 0;
     int rsrc_var_class_count = 0;
-    std::deque<tbl> tables; /* all others; the records that own them refer to them */
+    std::deque<tbl> tables;          /* all others; the records that own them refer to them */
+    std::vector<tbl *> spare_tables; /* those of them that have been filed */
+    std::deque<tbl_content> filed;   /* what is left of these: blocks of their own, */
+    text_pool filed_small;           /* or a few bytes, and what refers to them */
 
     /* What attribute lines leave for later */
     std::unique_ptr<char, free_memory> rm_name; /* the resource manager; null until named */

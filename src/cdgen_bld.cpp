@@ -21,7 +21,7 @@ namespace {
 constexpr size_t PREFILL_BLOCK = 1024;
 
 size_t used_bytes(const cdb_ref_t &table) {
-    const tbl *t = staged_tbl(table);
+    const tbl_content *t = staged_content(table);
     return t == nullptr || t->tbl_base == nullptr ? 0 : t->used();
 }
 
@@ -39,7 +39,7 @@ vx_uint32_t checked_size(cdgen &cx, size_t bytes) {
 vx_uint16_t checked_count(cdgen &cx, const cdb_ref_t &table, size_t record) {
     size_t count = used_bytes(table) / record;
     if (count > std::numeric_limits<vx_uint16_t>::max())
-        bld_error_exit(cx, "Too many records of one kind in a class (65535 at most): ", staged_tbl(table)->tbl_name,
+        bld_error_exit(cx, "Too many records of one kind in a class (65535 at most): ", staged_content(table)->tbl_name,
                        nullptr, 1);
     return static_cast<vx_uint16_t>(count);
 }
@@ -179,11 +179,11 @@ public:
     /* A staged table's bytes. */
     void write_table(const cdb_ref_t &table) {
         if (size_t size = used_bytes(table))
-            write(staged_tbl(table)->tbl_base, size);
+            write(staged_content(table)->tbl_base, size);
     }
 
     /* The same, zero-filled to a multiple of 8; returns its rounded size. */
-    vx_uint32_t write_rounded(const tbl *t) {
+    vx_uint32_t write_rounded(const tbl_content *t) {
         size_t size = t == nullptr || t->tbl_base == nullptr ? 0 : t->used();
         write(size > 0 ? t->tbl_base : nullptr, size);
         constexpr char zeros[8] = {};
@@ -253,7 +253,7 @@ void add_class(cdgen &cx, const rsrc_class_t &staged) {
         auto offset = static_cast<vx_uint32_t>(cx.dsp - at);
         record.*field = {{form == class_side_table::UNLOCATED ? 0 : offset, 0}};
         if (form == class_side_table::ROUNDED)
-            out.write_rounded(staged_tbl(staged.*field));
+            out.write_rounded(staged_content(staged.*field));
         else
             out.write_table(staged.*field);
     }
@@ -269,7 +269,7 @@ void add_mgr(cdgen &cx, const rsrc_mgr_t &staged) {
     record.u_rm_RMname = {};
     record.u_rm_strings_table = {};
     out.write(&record, sizeof record);
-    out.write_rounded(staged_tbl(staged.u_rm_strings_table));
+    out.write_rounded(staged_content(staged.u_rm_strings_table));
     out.finish();
 }
 
@@ -278,7 +278,7 @@ void add_cmmap(cdgen &cx, const rsrc_cmmap_t &staged) {
     rsrc_cmmap_t record = staged;
     record.u_rcm_strings = {{sizeof record, 0}};
     out.write(&record, sizeof record);
-    out.write_rounded(staged_tbl(staged.u_rcm_strings));
+    out.write_rounded(staged_content(staged.u_rcm_strings));
     out.finish();
 }
 
@@ -287,7 +287,7 @@ void add_var_class(cdgen &cx, const rsrc_variable_class_t &staged) {
     section out(cx, CDB_DSECT_VAR_CLASS);
     char *at = out.write(&staged, sizeof staged);
     rsrc_variable_class_t record = staged;
-    record.u_rvc_string_tbl = {{out.write_rounded(staged_tbl(staged.u_rvc_string_tbl)), 0}};
+    record.u_rvc_string_tbl = {{out.write_rounded(staged_content(staged.u_rvc_string_tbl)), 0}};
     out.write_rounded(find_tbl_entry(cx, &staged));
     store(at, record);
     out.finish();

@@ -2,40 +2,65 @@
 
 #include "cdgen.h"
 
+#include <bit>
+#include <functional>
+#include <optional>
 #include <string_view>
-#include <unordered_map>
 
 namespace {
 
 constexpr size_t VARIABLE_IDS_AU = 64;
 
-/* A variable class and its list, which is made with its first ID. */
-struct class_and_list {
-    rsrc_variable_class_t *rvcp;
-    tbl *list;
+/* Variable classes by name; of several with one name, the first. */
+class class_index {
+public:
+    explicit class_index(std::span<rsrc_variable_class_t> all)
+        : classes(all), slots(std::bit_ceil(2 * all.size() + 1)) {
+        for (vx_uint32_t number = 1; number <= classes.size(); ++number)
+            if (is_named(classes[number - 1]))
+                enter(number);
+    }
+
+    rsrc_variable_class_t *find(std::string_view name) const {
+        vx_uint32_t number = slots[slot_of(name)];
+        return number == 0 ? nullptr : &classes[number - 1];
+    }
+
+private:
+    /* One without a name is one without strings. */
+    static bool is_named(const rsrc_variable_class_t &variable_class) {
+        const tbl_content *strings = staged_content(variable_class.u_rvc_string_tbl);
+        return strings != nullptr && strings->tbl_base != nullptr;
+    }
+
+    std::string_view name_of(vx_uint32_t number) const {
+        const rsrc_variable_class_t &named = classes[number - 1];
+        return staged_content(named.u_rvc_string_tbl)->tbl_base + named.u_rvc_name.offset[0];
+    }
+
+    /* Where the name stands, or else may be entered. */
+    size_t slot_of(std::string_view name) const {
+        size_t slot = std::hash<std::string_view>()(name) % slots.size();
+        while (slots[slot] != 0 && name_of(slots[slot]) != name)
+            slot = (slot + 1) % slots.size();
+        return slot;
+    }
+
+    void enter(vx_uint32_t number) {
+        if (vx_uint32_t &slot = slots[slot_of(name_of(number))]; slot == 0)
+            slot = number;
+    }
+
+    std::span<rsrc_variable_class_t> classes;
+    std::vector<vx_uint32_t> slots; /* positions of classes, counted from 1; at least half of them are free: 0 */
 };
 
-/* Variable classes by name; of several with one name, the first. */
-using class_index = std::unordered_map<std::string_view, class_and_list>;
-
-/* One without a name, which is one without strings, is found under none. */
-class_index index_by_name(cdgen &cx) {
-    class_index index;
-    for (rsrc_variable_class_t &variable_class : records_of<rsrc_variable_class_t>(&cx.rsrc_var_class_tbl)) {
-        const tbl *strings = staged_tbl(variable_class.u_rvc_string_tbl);
-        if (strings->tbl_base != nullptr)
-            index.try_emplace(strings->tbl_base + variable_class.u_rvc_name.offset[0],
-                              class_and_list{&variable_class, nullptr});
-    }
-    return index;
-}
-
 /* A name that is no variable class's is deliberately dropped in silence. */
-void add_varID_to_var_class(cdgen &cx, class_index &index, const char *srch_name, var_id_t varID) {
-    auto found = index.find(srch_name);
-    if (found == index.end())
+void add_varID_to_var_class(cdgen &cx, const class_index &index, const char *srch_name, var_id_t varID) {
+    rsrc_variable_class_t *rvcp = index.find(srch_name);
+    if (rvcp == nullptr)
         return;
-    auto &[rvcp, list] = found->second;
+    tbl *list = find_tbl_entry(cx, rvcp);
     if (list == nullptr) {
         list = make_tbl(cx, VARIABLE_IDS_AU, "VariableIDs");
         add_tbl_entry(cx, rvcp, list);
@@ -45,13 +70,17 @@ void add_varID_to_var_class(cdgen &cx, class_index &index, const char *srch_name
 }
 
 /* In a file no attribute refers to its variable class. */
-void take_ids(cdgen &cx, class_index &index, const rsrc_class_t &rsrc_class, const cdb_ref_t &dattrs, var_id_t mark) {
-    tbl *strings = staged_tbl(rsrc_class.u_rc_strings);
-    for (rsrc_dattr_t &attr : records_of<rsrc_dattr_t>(staged_tbl(dattrs))) {
+void take_ids(cdgen &cx, std::optional<class_index> &index, const rsrc_class_t &rsrc_class, const cdb_ref_t &dattrs,
+              var_id_t mark) {
+    tbl_content *strings = staged_content(rsrc_class.u_rc_strings);
+    for (rsrc_dattr_t &attr : records_of<rsrc_dattr_t>(staged_content(dattrs))) {
         vx_uint32_t name = attr.u_ra_vclass.offset[0];
-        if (name != CDB_NONE)
-            add_varID_to_var_class(cx, index, static_cast<const char *>(tbl_at(cx, strings, name, 1)),
+        if (name != CDB_NONE) {
+            if (!index)
+                index.emplace(records_of<rsrc_variable_class_t>(&cx.rsrc_var_class_tbl));
+            add_varID_to_var_class(cx, *index, static_cast<const char *>(tbl_at(cx, strings, name, 1)),
                                    static_cast<var_id_t>(attr.ra_attr_id) | mark);
+        }
         attr.u_ra_vclass = {};
     }
 }
@@ -59,7 +88,7 @@ void take_ids(cdgen &cx, class_index &index, const rsrc_class_t &rsrc_class, con
 } // namespace
 
 void bld_var_id_tbls(cdgen &cx) {
-    class_index index = index_by_name(cx);
+    std::optional<class_index> index; /* made if there is a name to look up */
     for (const rsrc_class_t &rsrc_class : records_of<rsrc_class_t>(&cx.rsrc_class_tbl)) {
         take_ids(cx, index, rsrc_class, rsrc_class.u_rc_dattrsC, VAR_ID_CLASS_ATTR);
         take_ids(cx, index, rsrc_class, rsrc_class.u_rc_dattrs, 0);

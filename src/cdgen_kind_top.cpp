@@ -117,7 +117,7 @@ void init_var_class_tbl(cdgen &cx) {
 }
 
 void cmplt_var_class_tbl(cdgen &cx) {
-    trim_tbl(staged_tbl(cx.cb_rsrc_variable_class.u_rvc_string_tbl));
+    file_tbl(cx, cx.cb_rsrc_variable_class.u_rvc_string_tbl);
     append_record(cx, &cx.rsrc_var_class_tbl, cx.cb_rsrc_variable_class);
     ++cx.rsrc_var_class_count;
     cx.cb_rsrc_variable_class.rvc_cb_ID = 0;
@@ -147,7 +147,7 @@ void cmplt_class_tbl(cdgen &cx) {
     flush_raw(cx, cx.cb_rsrc_pattr, &rsrc_class_t::u_rc_pattrs, cx.pattr_vv_found);
     flush_raw(cx, cx.cb_rsrc_dattr, &rsrc_class_t::u_rc_dattrs, cx.dattr_vv_found);
     for (const class_table &table : class_tables)
-        trim_tbl(staged_tbl(rsrc_class.*table.field));
+        file_tbl(cx, rsrc_class.*table.field);
     append_record(cx, &cx.rsrc_class_tbl, rsrc_class);
     ++cx.rsrc_class_count;
     rsrc_class.rc_cb_ID = 0;

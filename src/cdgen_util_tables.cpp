@@ -7,6 +7,8 @@
 #include <cmath>
 #include <cstdio>
 #include <cstdlib>
+#include <memory>
+#include <new>
 #include <utility>
 
 tbl::~tbl() {
@@ -30,7 +32,12 @@ void *cfg_malloc(cdgen &cx, size_t s) {
 }
 
 tbl *make_tbl(cdgen &cx, size_t au, const char *name) {
-    return &cx.tables.emplace_back(au, name);
+    if (cx.spare_tables.empty())
+        return &cx.tables.emplace_back(au, name);
+    tbl *spare = cx.spare_tables.back();
+    cx.spare_tables.pop_back();
+    std::destroy_at(spare);
+    return std::construct_at(spare, au, name);
 }
 
 namespace {
@@ -145,7 +152,7 @@ void memcpy_8_rounded(char *dst, const char *src, int len) {
         memset(dst + len, 0, static_cast<size_t>(rounded - len));
 }
 
-void *tbl_at(cdgen &cx, tbl *t, size_t offset, size_t size) {
+void *tbl_at(cdgen &cx, tbl_content *t, size_t offset, size_t size) {
     if (t->tbl_base == nullptr || offset > t->used() || size > t->used() - offset)
         cdgen_error_exit(cx, t->tbl_name, ": reference outside the table - internal error", nullptr, 0, 1);
     return t->tbl_base + offset;
@@ -194,4 +201,35 @@ void text_pool::clear() {
     while (head->next != nullptr)
         free(std::exchange(head->next, head->next->next));
     left = head->size;
+}
+
+namespace {
+
+constexpr size_t SMALL = 256; /* bytes: a block for as little would take half as much again */
+
+tbl_content *keep_copy(cdgen &cx, const tbl &t) {
+    char *content = cx.filed_small.take(sizeof(tbl_content) + t.used());
+    if (content == nullptr)
+        table_failure(cx, t, ": alloc_tble malloc failure: ");
+    char *bytes = content + sizeof(tbl_content);
+    memcpy(bytes, t.tbl_base, t.used());
+    return new (content) tbl_content{bytes, bytes + t.used(), t.tbl_name};
+}
+
+tbl_content *keep_block(cdgen &cx, tbl &t) {
+    trim_tbl(&t);
+    tbl_content *kept = &cx.filed.emplace_back(t);
+    t.tbl_base = t.tbl_next = nullptr;
+    return kept;
+}
+
+} // namespace
+
+void file_tbl(cdgen &cx, cdb_ref_t &ref) {
+    tbl *open = staged_tbl(ref);
+    if (open->used() == 0)
+        stage_tbl(ref, nullptr);
+    else
+        stage_tbl(ref, open->used() <= SMALL ? keep_copy(cx, *open) : keep_block(cx, *open));
+    cx.spare_tables.push_back(open);
 }

@@ -405,7 +405,7 @@ TEST(Run, AtTheEndOfTheSourceComesAfterItsAttribute) {
     compilation c;
     c.compile_all(CLASS + MAP + pattr(P, "SD") + element("PAttrSDDefinition", 0, "Int32"));
     const rsrc_class_t &filed = records_of<rsrc_class_t>(&c.cx.rsrc_class_tbl)[0];
-    const rsrc_pattr_t &attr = records_of<rsrc_pattr_t>(staged_tbl(filed.u_rc_pattrs))[0];
+    const rsrc_pattr_t &attr = records_of<rsrc_pattr_t>(staged_content(filed.u_rc_pattrs))[0];
     EXPECT_EQ(attr.u_ra_sd.offset[0], 0U);
     EXPECT_EQ(attr.ra_max_sd_idx, 0xFFFFU);
     EXPECT_EQ(attr.ra_dflt_value.val_uint64, 0U);

@@ -209,6 +209,55 @@ TEST_F(Tables, TrimmingLeavesEmptyOnesAlone) {
     expect_sound(empty);
 }
 
+/* What a record refers to once its table is filed. */
+const tbl_content *filed(cdgen &cx, size_t length) {
+    cdb_ref_t ref;
+    stage_tbl(ref, make_tbl(cx, 32, "Records"));
+    tbl *t = staged_tbl(ref);
+    memset(alloc_tble(cx, t, length), 'x', length);
+    file_tbl(cx, ref);
+    return staged_content(ref);
+}
+
+TEST_F(Tables, FiledOnesKeepWhatTheyHold) {
+    for (size_t length : {1, 32, 256, 257, 100000}) { /* up to 256: without a block of their own */
+        const tbl_content *content = filed(cx, length);
+        const tbl_content *next = filed(cx, length); /* leaves the one before it alone */
+        EXPECT_NE(content, next);
+        EXPECT_STREQ(content->tbl_name, "Records");
+        EXPECT_EQ(std::string(content->tbl_base, content->used()), std::string(length, 'x'));
+        EXPECT_EQ(cx.filed.size(), length <= 256 ? 0U : length == 257 ? 2U : 4U);
+    }
+}
+
+TEST_F(Tables, FiledOnesThatHoldNothingAreNone) {
+    cdb_ref_t ref;
+    stage_tbl(ref, make_tbl(cx, 32, "Records"));
+    reserve(*staged_tbl(ref), 0);
+    file_tbl(cx, ref);
+    EXPECT_EQ(staged_content(ref), nullptr);
+    EXPECT_TRUE(records_of<vx_uint32_t>(staged_content(ref)).empty());
+}
+
+TEST_F(Tables, FiledOnesServeAgain) {
+    cdb_ref_t ref;
+    tbl *first = make_tbl(cx, 8192, "First");
+    stage_tbl(ref, first);
+    reserve(*first, 9000);
+    file_tbl(cx, ref);
+    tbl *second = make_tbl(cx, 32, "Second");
+    EXPECT_EQ(second, first);
+    EXPECT_EQ(cx.tables.size(), 1U);
+    EXPECT_STREQ(second->tbl_name, "Second");
+    EXPECT_EQ(second->tbl_au, 32U);
+    EXPECT_EQ(second->tbl_size + second->tbl_capacity, 0U);
+    EXPECT_EQ(reserve(*second, 8), 0U);
+    EXPECT_EQ(second->tbl_size, 32U);
+    EXPECT_EQ(contents(*second), std::string(8, '\0'));
+    expect_sound(*second);
+    EXPECT_NE(make_tbl(cx, 32, "Third"), second);
+}
+
 /* ---- Traces ---------------------------------------------------------------------------------------------------- */
 
 std::string shown(const char *what, int bytes) {

@@ -157,17 +157,22 @@ public:
         return ending_of([&] { feed(kind, text); });
     }
 
+    /* While the class is open. */
     tbl *table(cdb_ref_t rsrc_class_t::*field) const {
         return staged_tbl(cx.cb_rsrc_class.*field);
     }
 
-    /* The records in a table of the open class. */
+    /* What is in a table of the class, be it open or closed. */
+    tbl_content *content(cdb_ref_t rsrc_class_t::*field) const {
+        return staged_content(cx.cb_rsrc_class.*field);
+    }
+
     template <class Record> std::span<Record> filed(cdb_ref_t rsrc_class_t::*field) const {
-        return records_of<Record>(table(field));
+        return records_of<Record>(content(field));
     }
 
     std::string string_at(vx_uint32_t offset) {
-        return static_cast<const char *>(tbl_at(cx, table(&rsrc_class_t::u_rc_strings), offset, 1));
+        return static_cast<const char *>(tbl_at(cx, content(&rsrc_class_t::u_rc_strings), offset, 1));
     }
 
     template <class Record> Record string_table_at(vx_uint32_t offset) {
@@ -176,7 +181,7 @@ public:
 
     template <class Record> Record copy_at(cdb_ref_t rsrc_class_t::*field, size_t offset) {
         Record record = {};
-        memcpy(&record, tbl_at(cx, table(field), offset, sizeof record), sizeof record);
+        memcpy(&record, tbl_at(cx, content(field), offset, sizeof record), sizeof record);
         return record;
     }
 

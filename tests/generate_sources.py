@@ -29,6 +29,7 @@ TYPES = {
 }
 STRUCTURED = ("SD", "SDArray")
 ELEMENT_TYPES = tuple(name for name in TYPES if name not in STRUCTURED)
+INPUT_TYPES = (*ELEMENT_TYPES, "SBS")  # of inputs and responses
 WITHOUT_TEXT = ("None", "RH", "RHArray", "SBS", *STRUCTURED)
 VARIABLES = ("Counter", "Quantity", "State", "Quantum")
 CLASS_PROPERTIES = (
@@ -284,7 +285,7 @@ class Writer:
     def class_input(self):
         """One of the class's inputs; not the one before, whose run would go on."""
         kind = self.random.choice([kind for kind in INPUTS if kind != self.input_before])
-        self.run(kind, types=(*ELEMENT_TYPES, "SBS"))
+        self.run(kind, types=INPUT_TYPES)
         self.input_before = kind
 
     # -- actions and groups --
@@ -300,9 +301,9 @@ class Writer:
             self.number_of("TimeOut"),
         )
         if self.chance(0.5):
-            self.run("ActionInSDDefinition")
+            self.run("ActionInSDDefinition", types=INPUT_TYPES)
         if self.chance(0.5):
-            self.run("ActionOutSDDefinition", bare=True)
+            self.run("ActionOutSDDefinition", bare=True, types=INPUT_TYPES)
 
     def group(self):
         """A variable class."""

@@ -21,6 +21,7 @@ import functools
 import operator
 import os
 import pathlib
+import re
 import struct
 import subprocess
 import sys
@@ -32,6 +33,7 @@ import reverse_cdb
 GROUPS = 40
 CASES = 20000
 MUTATIONS = 2  # of each source
+CATALOGUED = 2000  # sources that have everything between them
 SAMPLE = 100  # one of so many is compiled by the program itself too
 TIMEOUT = 1800
 SHARED_MEMORY = pathlib.Path("/dev/shm")
@@ -309,21 +311,82 @@ def check_group(programs, seeds):
 # ---- The generator ---------------------------------------------------------------
 
 
+class Catalogue:
+    """Stanzas, attributes of each, and words of each of these that has a value of certain words."""
+
+    # Whose table the properties of a stanza are in.
+    TABLES = {
+        "ResourceClass": "class",
+        "PersistentResourceAttribute": "persistent",
+        "PersistentClassAttribute": "persistent",
+        "DynamicResourceAttribute": "dynamic",
+        "DynamicClassAttribute": "dynamic",
+        "ResourceAction": "action",
+        "ClassAction": "action",
+    }
+    ATTRIBUTES = generate_sources.STANZAS[4:8]
+    ELEMENTS = generate_sources.STANZAS[10:]
+    # What is refused, so that no source that is right has it.
+    REFUSED = {
+        "an element has no default of its own": {(kind, "DefaultValue") for kind in ELEMENTS},
+        "an action's response takes required attributes only": {
+            ("ActionOutSDDefinition", name) for name in ("ValidValue", "ValueDisplayName")
+        },
+        "no attribute, nor an element of one, is a structured byte string": {
+            (kind, "DataType", "SBS") for kind in (*ATTRIBUTES, *ELEMENTS[:2])
+        },
+        "no element is a structure": {(kind, "DataType", name) for kind in ELEMENTS for name in ("SD", "SDArray")},
+    }
+
+    def __init__(self, listing):
+        self.rows = [line.split() for line in listing.splitlines()]
+
+    def of(self, what):
+        """The rows of a kind of name."""
+        return [row[1:] for row in self.rows if row[0] == what]
+
+    def words(self, stanza, form):
+        """What a value of that form may be, if that is certain words."""
+        if form == "names":
+            return [name for table, name, _ in self.of("property") if table == self.TABLES[stanza]]
+        lists = {"type": "type", "a letter": "permission", "Counter, Quantity, State or Quantum": "variable"}
+        return [row[0] for row in self.of(lists[form])] if form in lists else []
+
+    def all(self):
+        """Everything that the language has, as tuples of one to three names."""
+        known = {tuple(row) for row in self.of("stanza")}
+        for stanza, name, _, _, *form in self.of("attribute"):
+            known.add((stanza, name))
+            known.update((stanza, name, word) for word in self.words(stanza, " ".join(form)))
+        return known
+
+    @staticmethod
+    def used_in(text):
+        """What a source has of it, and words of other values."""
+        used, stanza = set(), None
+        for line in text.split("\n"):
+            word = re.split("[ \t]", line)[0]
+            if word in generate_sources.STANZAS:
+                stanza = word
+                used.add((stanza,))
+            elif word == "":
+                name, _, value = line.strip(" \t").partition("=")
+                used.add((stanza, name))
+                used.update((stanza, name, one) for one in re.split("[ \t]", value)[0].strip('"').split(","))
+        return used
+
+
 def check_catalogue(programs, _):
-    """Whatever name the language has comes up in the first thousand sources."""
-    listed = subprocess.run([programs.list_names], capture_output=True, text=True, check=True).stdout.split("\n")
-    text = b"\n".join(generate_sources.source(seed)[0] for seed in range(1000)).decode("latin-1")
-    lines = [line.strip() for line in text.split("\n")]
-    starts = {line.partition("=")[0].partition(" ")[0].partition("\t")[0] for line in lines}
-    words = {word for line in lines for word in line.partition("=")[2].split(" ")[0].split("\t")[0].strip('"').split(",")}
-    problems = []
-    for what, *rest in (line.split() for line in listed if line):
-        name = rest[1] if what in ("attribute", "property") else rest[0]
-        refused = (what, name) == ("attribute", "DefaultValue") and "SDDefinition" in rest[0] or name == "SBS"
-        among = starts if what in ("stanza", "attribute") else words
-        if what != "field" and not refused and name not in among:
-            problems.append(f"{what} {' '.join(rest)} never comes up")
-    return problems
+    """Whatever the language has comes up in the first sources, where it belongs."""
+    listing = subprocess.run([programs.list_names], capture_output=True, text=True, check=True).stdout
+    known = Catalogue(listing).all()
+    refused = set().union(*Catalogue.REFUSED.values())
+    used = set()
+    for seed in range(CATALOGUED):
+        used |= Catalogue.used_in(generate_sources.source(seed)[0].decode("latin-1"))
+    problems = [f"{' '.join(names)} never comes up" for names in sorted(known - refused - used)]
+    problems += [f"{' '.join(names)} comes up and should be refused" for names in sorted(refused & used)]
+    return problems + [f"{' '.join(names)} is refused and not in the language" for names in sorted(refused - known)]
 
 
 def check_determined(_, seeds):

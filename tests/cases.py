@@ -1,4 +1,4 @@
-"""What the drivers of single cases share: the registry, and a directory to run cdgen in.
+"""What the drivers of single cases share: the registry, and a directory to run the programs in.
 
 A case is a function that takes a World and raises Failure when it does not
 hold, or Skip when the machine does not allow it.  A driver without a program
@@ -6,6 +6,7 @@ prints the names of its cases, so that each can be a test of its own.
 """
 
 import argparse
+import contextlib
 import os
 import pathlib
 import resource
@@ -49,6 +50,8 @@ PersistentResourceAttribute
 	VarietyRange=1,2
 	DefaultValue=The default of attribute %d
 """
+
+
 class Skip(Exception):
     """The machine does not allow the case."""
 
@@ -71,10 +74,12 @@ def attributes(count):
 class World:
     """A directory of its own with the program, a source, and what runs there."""
 
-    def __init__(self, program, directory):
+    def __init__(self, options, directory):
         self.directory = directory
+        self.locales = options.locales
+        self.cdef = options.cdef
         self.program = directory / "cdgen"
-        shutil.copy(program, self.program)  # where any user can reach it
+        shutil.copy(options.cdgen, self.program)  # where any user can reach it
         os.chmod(directory, 0o777)
         self.write(SOURCE, HEAD)
 
@@ -106,6 +111,27 @@ class World:
         streams = {"stdout": subprocess.PIPE, "stderr": subprocess.PIPE, **more}
         command = [self.program, *(arguments or (SOURCE, OUT))]
         return subprocess.run(command, timeout=TIMEOUT, **self.options(**streams))
+
+    def inspect(self, *arguments, **more):
+        """A run of cdef."""
+        streams = {"stdout": subprocess.PIPE, "stderr": subprocess.PIPE, **more}
+        return subprocess.run([self.cdef, *arguments], timeout=TIMEOUT, **self.options(**streams))
+
+    def verified(self, name=OUT):
+        """A database in which cdef finds no error."""
+        expect(self.inspect("verify", "-q", name), 0)
+
+    @contextlib.contextmanager
+    def left_alone(self, name=OUT):
+        """Whatever runs meanwhile, a file stays what it is, to the inode and the time."""
+
+        def identity():
+            status = os.stat(self.path(name))
+            return status.st_ino, status.st_mtime_ns, self.read(name)
+
+        before = identity()
+        yield
+        check(identity() == before, name, "was touched")
 
     def good(self, source=None):
         """The database of a source, made without any fault; the output is gone again."""
@@ -143,11 +169,11 @@ class Cases:
         self.functions[function.__name__.replace("_", "-")] = function
         return function
 
-    def run(self, name, program):
+    def run(self, name, options):
         """One case in a directory of its own; "", "skipped" or what does not hold."""
         with tempfile.TemporaryDirectory(prefix="cdgen-case-") as directory:
             try:
-                self.functions[name](World(program, pathlib.Path(directory)))
+                self.functions[name](World(options, pathlib.Path(directory)))
             except Skip as reason:
                 print(f"SKIP {name}\n    {reason}")
                 return SKIPPED
@@ -159,14 +185,15 @@ class Cases:
     def main(self, description):
         """Runs the named cases, or all, and prints the count; without a program, prints the names."""
         parser = argparse.ArgumentParser(description=description.splitlines()[0])
-        parser.add_argument("--cdgen", type=pathlib.Path)
+        for given in ("cdgen", "cdef", "locales"):
+            parser.add_argument(f"--{given}", type=lambda text: pathlib.Path(text).resolve())
         parser.add_argument("names", nargs="*")
         options = parser.parse_args()
         if options.cdgen is None:
             print("\n".join(self.functions))
             return 0
         names = options.names or list(self.functions)
-        results = [self.run(name, options.cdgen.resolve()) for name in names]
+        results = [self.run(name, options) for name in names]
         print(f"{results.count(0)} passed, {results.count(1)} failed, {results.count(SKIPPED)} skipped")
         if any(result == 1 for result in results):
             return 1

@@ -100,9 +100,8 @@ class Case:
         return None
 
 
-def prepare(case, directory, program):
-    """Fill the case's directory: the program's link, the source, the set-up."""
-    (directory / "cdgen").symlink_to(program)
+def set_up(case, directory):
+    """What the case needs besides the program: the source, and what its set-up says."""
     if case.source.exists():
         (directory / case.source.name).write_bytes(case.source.read_bytes())
     for action, *names in case.setup:
@@ -138,7 +137,8 @@ def run(case, program, extra):
     environment = {**os.environ, "VX_CDB_FORCE_EMPTY_TIMESTAMP": "", "LC_ALL": "C"}
     with tempfile.TemporaryDirectory() as name:
         directory = pathlib.Path(name)
-        prepare(case, directory, program)
+        (directory / "cdgen").symlink_to(program)
+        set_up(case, directory)
         before = snapshot(directory)
         result = subprocess.run(
             command, cwd=directory, env=environment, stdin=subprocess.DEVNULL, capture_output=True, timeout=TIMEOUT

@@ -12,6 +12,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <iostream>
+#include <new>
 #include <unistd.h>
 
 namespace cdef {
@@ -179,6 +180,8 @@ int main(int argc, char **argv) {
     try {
         try {
             return cdef::run(argc, argv);
+        } catch (const std::bad_alloc &) {
+            throw; /* it has no words of ours */
         } catch (const std::exception &trouble) {
             cdef::tell(trouble.what());
         }

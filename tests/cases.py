@@ -133,11 +133,11 @@ class World:
         yield
         check(identity() == before, name, "was touched")
 
-    def good(self, source=None):
-        """The database of a source, made without any fault; the output is gone again."""
+    def good(self, source=None, *options):
+        """The database of a source, made without any fault."""
         if source is not None:
             self.write(SOURCE, source)
-        result = self.run(SOURCE, "good.cdef")
+        result = self.run(*options, SOURCE, "good.cdef")
         check(result.returncode == 0, "a good source does not compile:", result.stderr)
         return self.read("good.cdef")
 

@@ -21,6 +21,8 @@ from cases import attributes, check, expect, limit, only_zeros
 OUT_OF_MEMORY = re.compile(
     rb"(cfg_malloc malloc failure: |\w+: alloc_tble (malloc|realloc) failure: |strdup failed: )Cannot allocate memory\n"
 )
+# While it checks a source, its own words or the compiler's.
+CDEF_OUT_OF_MEMORY = re.compile(rb"cdef: (out of memory\n|class\.cdefsrc: " + OUT_OF_MEMORY.pattern + rb")")
 WRONG = HEAD + b"\tNoSuchAttribute=1\n"
 WRONG_MESSAGE = b"16: Attribute name not defined in table (name/table): NoSuchAttributeClassToManagerMapping\n"
 
@@ -35,21 +37,22 @@ def closed(*descriptors):
 # ---- Memory ------------------------------------------------------------------
 
 
-def limited(world, option, kilobytes, *arguments):
-    """A run in so much memory: option v is the address space, d the data."""
-    command = shlex.join([str(world.program), *arguments])
-    script = f"ulimit -{option} {kilobytes} && exec {command}"
+def limited(world, option, kilobytes, *command):
+    """A command in so much memory: option v is the address space, d the data, s the stack."""
+    script = f"ulimit -{option} {kilobytes} && exec {shlex.join(map(str, command))}"
     return subprocess.run(["sh", "-c", script], capture_output=True, timeout=TIMEOUT, **world.options())
 
 
-def least_memory(world, option):
-    """The least memory, in KB, in which the program starts and prints its usage."""
+def least_memory(world, option, *command):
+    """The least memory, in KB, in which a command does the same as in 1 GB."""
+    enough = 1 << 20
+    usual = subprocess.run(command, capture_output=True, timeout=TIMEOUT, **world.options())
 
     def starts(kilobytes):
-        result = limited(world, option, kilobytes)
-        return result.returncode == 1 and result.stderr.startswith(b"Usage: ")
+        result = limited(world, option, kilobytes, *command)
+        return (result.returncode, result.stdout, result.stderr) == (usual.returncode, usual.stdout, usual.stderr)
 
-    low, high = 0, 1 << 20
+    low, high = 0, enough
     if not starts(high):
         raise Skip("the program needs more than 1 GB to start: a sanitizer")
     while high - low > 4:
@@ -58,61 +61,177 @@ def least_memory(world, option):
     return high
 
 
-def in_memory(world, option, kilobytes, good):
-    """Whether so much memory is enough; if not, message, status and output have to be right."""
-    world.write(OUT, BEFORE)
-    result = limited(world, option, kilobytes, SOURCE, OUT)
-    what = (f"{kilobytes} KB:", result.returncode, result.stderr)
-    check(result.stdout == b"", *what)
-    if result.returncode == 0:
-        check(world.read() == good and result.stderr == b"", *what)
-    elif result.returncode == errno.ENOMEM:
-        check(OUT_OF_MEMORY.fullmatch(result.stderr) and world.read() == BEFORE, *what)
-    else:
-        expect(result, 1, b"Cannot map CDB file: Cannot allocate memory\n")
-        only_zeros(world)
-    return result.returncode == 0
-
-
-def every_level(world, source, option, steps):
-    """From the least memory up, in coarser and coarser steps, until it is enough."""
-    good = world.good(source)
-    least = least_memory(world, option)
+def every_level(least, steps, enough):
+    """From the least memory up, in coarser and coarser steps, until it is enough; how often it was not."""
     level = 0
     failures = 0
-    while not in_memory(world, option, least + level, good):
+    while not enough(least + level):
         failures += 1
         level += max(4, level // steps // 4 * 4)
     return failures
 
 
+def last_line(text):
+    """What is in front of it, and the last line."""
+    at = text.rfind(b"\n", 0, -1) + 1
+    return text[:at], text[at:]
+
+
+def compiles_in(world, option, kilobytes, good, traces, *options):
+    """Whether so much memory is enough; if not, message, status and output have to be right, and the traces up to there."""
+    world.write(OUT, BEFORE)
+    result = limited(world, option, kilobytes, world.program, *options, SOURCE, OUT)
+    trace, message = last_line(result.stderr)
+    what = (f"{kilobytes} KB:", result.returncode, message)
+    if result.returncode == 0:
+        check((result.stdout, result.stderr) == traces and world.read() == good, *what)
+        return True
+    check(traces[0].startswith(result.stdout) and traces[1].startswith(trace), *what, "other traces")
+    if result.returncode == errno.ENOMEM:
+        check(OUT_OF_MEMORY.fullmatch(message) and world.read() == BEFORE, *what)
+    else:
+        check(result.returncode == 1 and message == b"Cannot map CDB file: Cannot allocate memory\n", *what)
+        only_zeros(world)
+    return False
+
+
+def compiled_in_all(world, source, option, steps, *options):
+    """A source is compiled in less memory than it needs, and in more and more."""
+    good = world.good(source, *options)
+    result = world.run(*options, SOURCE, OUT)
+    traces = (result.stdout, result.stderr)
+    least = least_memory(world, option, world.program)
+    return every_level(least, steps, lambda level: compiles_in(world, option, level, good, traces, *options))
+
+
 @case
 def memory_for_a_small_source(world):
     """Address space in steps of a page."""
-    failures = every_level(world, HEAD + attributes(1000), "v", 1 << 30)
+    failures = compiled_in_all(world, HEAD + attributes(1000), "v", 1 << 30)
     check(failures > 0, "every level was enough")
 
 
 @case
 def memory_for_a_large_source(world):
     """Address space for 20,000 attributes, from a page more than the program needs to start."""
-    failures = every_level(world, HEAD + attributes(20000), "v", 30)
+    failures = compiled_in_all(world, HEAD + attributes(20000), "v", 30)
     check(failures > 20, "only", failures, "levels were too low")
+
+
+@case
+def memory_for_the_other_byte_order(world):
+    """The same with option s."""
+    failures = compiled_in_all(world, HEAD + attributes(20000), "v", 30, "-s")
+    check(failures > 20, "only", failures, "levels were too low")
+
+
+@case
+def memory_for_traces(world):
+    """With every trace on, which end where the memory does."""
+    failures = compiled_in_all(world, HEAD + attributes(5000), "v", 30, "-d", "3")
+    check(failures > 20, "only", failures, "levels were too low")
+
+
+LONG_LIST = ATTRIBUTE.replace(b"DataType=String", b"DataType=StringArray") % (1, 1, 1) + b"".join(
+    b"\tValidValue=value %d,value %d\n" % (i, i + 1) for i in range(30000)
+)
 
 
 @case
 def memory_for_long_lists(world):
     """Address space for one attribute with many values, which stand in tables that grow."""
-    values = b"".join(b"\tValidValue=value %d,value %d\n" % (i, i + 1) for i in range(30000))
-    array = ATTRIBUTE.replace(b"DataType=String", b"DataType=StringArray")
-    failures = every_level(world, HEAD + array % (1, 1, 1) + values, "v", 30)
+    failures = compiled_in_all(world, HEAD + LONG_LIST, "v", 30)
     check(failures > 20, "only", failures, "levels were too low")
 
 
 @case
 def memory_of_data(world):
     """The other limit, on the data alone."""
-    every_level(world, HEAD + attributes(20000), "d", 30)
+    failures = compiled_in_all(world, HEAD + attributes(20000), "d", 30)
+    check(failures > 20, "only", failures, "levels were too low")
+
+
+# ---- Memory of cdef ----------------------------------------------------------
+
+
+def inspects_in(world, kilobytes, whole, *arguments):
+    """Whether so much memory is enough for cdef; if not, it says so, behind what it has printed."""
+    result = limited(world, "v", kilobytes, world.cdef, *arguments)
+    what = (*arguments, f"in {kilobytes} KB:", result.returncode, result.stderr)
+    if result.returncode == 0:
+        check((result.stdout, result.stderr) == (whole, b""), *what)
+    else:
+        check(result.returncode == 2 and CDEF_OUT_OF_MEMORY.fullmatch(result.stderr), *what)
+        check(whole.startswith(result.stdout), *what, "another output")
+    return result.returncode == 0
+
+
+def inspected_in_all(world, *arguments):
+    """The same in less memory than cdef needs, and in more and more."""
+    world.write(OUT, world.good(HEAD + attributes(3000)))
+    result = world.inspect(*arguments)
+    expect(result, 0, stdout=result.stdout)
+    least = least_memory(world, "v", world.cdef, "--version")
+    failures = every_level(least, 20, lambda level: inspects_in(world, level, result.stdout, *arguments))
+    check(failures > 20, "only", failures, "levels were too low")
+
+
+@case
+def memory_for_verifying(world):
+    """A database of 3,000 attributes."""
+    inspected_in_all(world, "verify", OUT)
+
+
+@case
+def memory_for_dumping(world):
+    """As text."""
+    inspected_in_all(world, "dump", OUT)
+
+
+@case
+def memory_for_dumping_json(world):
+    """As JSON."""
+    inspected_in_all(world, "dump", "--json", OUT)
+
+
+@case
+def memory_for_checking(world):
+    """A source of 3,000 attributes."""
+    inspected_in_all(world, "check", SOURCE)
+
+
+# ---- Stack -------------------------------------------------------------------
+
+STACK = 128  # KB
+
+
+def on_small_stack(world, *command):
+    """A command ends well, and as it always does."""
+    usual = subprocess.run(command, capture_output=True, timeout=TIMEOUT, **world.options())
+    result = limited(world, "s", STACK, *command)
+    expect(result, 0, usual.stderr, usual.stdout)
+
+
+@case
+def stack_does_not_grow_with_the_source(world):
+    """Many attributes, and one with many values, in either byte order and traced."""
+    least_memory(world, "v", world.program)
+    for source in (attributes(20000), LONG_LIST):
+        for options in ((), ("-s",), ("-d", "3")):
+            good = world.good(HEAD + source, *options)
+            on_small_stack(world, world.program, *options, SOURCE, OUT)
+            check(world.read() == good, *options, "another database")
+
+
+@case
+def stack_of_cdef_does_not_grow(world):
+    """Whatever is read of the same."""
+    least_memory(world, "v", world.cdef, "--version")
+    for source in (attributes(5000), LONG_LIST):
+        world.write(OUT, world.good(HEAD + source))
+        for arguments in (("verify",), ("dump",), ("dump", "--json"), ("source",)):
+            on_small_stack(world, world.cdef, *arguments, OUT)
+        on_small_stack(world, world.cdef, "check", SOURCE)
 
 
 # ---- Streams -----------------------------------------------------------------

@@ -1,0 +1,21 @@
+"""A locale whose numbers have a comma for a point, for programs that must not care.
+
+The tests build it themselves, from the sources in Debian's package locales:
+a machine for tests has none.
+"""
+
+import os
+import subprocess
+
+NAME = "de_DE.UTF-8"
+
+
+def environment(locales):
+    """The variables that choose it, of the directory that it was built in; they have been seen to take effect."""
+    chosen = {"LOCPATH": str(locales), "LC_ALL": NAME}
+    result = subprocess.run(
+        ["locale", "decimal_point"], env={**os.environ, **chosen}, capture_output=True, text=True, check=True, timeout=60
+    )
+    if (result.stdout, result.stderr) != (",\n", ""):
+        raise OSError(f"the locale {NAME} in {locales} has no effect: {result.stdout}{result.stderr}")
+    return chosen

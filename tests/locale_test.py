@@ -1,0 +1,92 @@
+"""The programs under a locale whose numbers have commas: nothing that they read or write changes.
+
+Every case is a function below, named for what is read or written.
+"""
+
+import subprocess
+import sys
+
+import german
+from cases import HEAD, OUT, SOURCE, TIMEOUT, Cases, check, expect
+
+NUMBERS = b"""\
+PersistentResourceAttribute
+	Name=Number%d
+	Description=3
+	DisplayName=4
+	Id=%d
+	DataType=%s
+	VarietyRange=1,2
+	DefaultValue=0.5
+	ValidValue=1.25,-2.5e-3
+DynamicResourceAttribute
+	Name=Measured%d
+	Description=5
+	DisplayName=6
+	Id=%d
+	DataType=%s
+	VariableType=Quantity
+	VarietyRange=3,4
+	InitialValue=1.5
+	Range=0.75,99.5
+	ValidStateValue=0x1.8p1
+"""
+SOURCE_OF_NUMBERS = HEAD + b"".join(
+    NUMBERS % (i, i, name, i, i + 10, name) for i, name in enumerate((b"Float32", b"Float64", b"Float32Array", b"Float64Array"))
+)
+
+case = Cases()
+
+
+def elsewhere(world):
+    """How a process is started under that locale."""
+    options = world.options()
+    return {**options, "env": {**options["env"], **german.environment(world.locales)}}
+
+
+@case
+def databases(world):
+    """What cdgen makes of floating point."""
+    good = world.good(SOURCE_OF_NUMBERS)
+    command = [world.program, SOURCE, OUT]
+    expect(subprocess.run(command, capture_output=True, timeout=TIMEOUT, **elsewhere(world)), 0)
+    check(world.read() == good, "another database")
+
+
+def inspected(world, *arguments):
+    """What cdef prints of it."""
+    world.write(OUT, world.good(SOURCE_OF_NUMBERS))
+    usual = world.inspect(*arguments)
+    result = subprocess.run([world.cdef, *arguments], capture_output=True, timeout=TIMEOUT, **elsewhere(world))
+    expect(usual, 0, usual.stderr, usual.stdout)
+    expect(result, 0, usual.stderr, usual.stdout)
+    return result
+
+
+@case
+def text(world):
+    """Of each number."""
+    check(b"99.5" in inspected(world, "dump", OUT).stdout, "the number is not in it")
+
+
+@case
+def json(world):
+    """Of each number."""
+    check(b"99.5" in inspected(world, "dump", "--json", OUT).stdout, "the number is not in it")
+
+
+@case
+def sources(world):
+    """Made of a database."""
+    check(b"Range=0.75,99.5" in inspected(world, "source", OUT).stdout, "the number is not in it")
+
+
+@case
+def findings(world):
+    """Of a database and of a source, which have none."""
+    inspected(world, "verify", OUT)
+    inspected(world, "check", SOURCE)
+
+
+if __name__ == "__main__":
+    sys.exit(case.main(__doc__))

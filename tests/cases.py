@@ -21,6 +21,7 @@ SOURCE = "class.cdefsrc"
 OUT = "out.cdef"
 BEFORE = b"what stood here before"
 BLOCK = 1024  # the output is filled by blocks of that size
+NOBODY = 65534
 LINE = 253  # characters of the longest line, without its newline
 
 HEAD = b"""\
@@ -146,6 +147,14 @@ def expect(result, status, stderr=b"", stdout=b""):
     """Status and streams of a run, exactly."""
     actual = (result.returncode, result.stderr, result.stdout)
     check(actual == (status, stderr, stdout), "expected", (status, stderr, stdout), "actual", actual)
+
+
+def as_nobody():
+    """In the child: another user, if this one is root."""
+    if os.geteuid() == 0:
+        os.setgroups([])
+        os.setgid(NOBODY)
+        os.setuid(NOBODY)
 
 
 def limit(what, value):

@@ -8,7 +8,6 @@ import json
 import os
 import pathlib
 import re
-import shutil
 import socket
 import subprocess
 import sys
@@ -117,17 +116,23 @@ class ManyNames(unittest.TestCase):
         self.assertEqual([each["notes"] for each in findings[1000:]], [[]] * 200)
 
 
-class Editors(unittest.TestCase):
-    """What the files for editors make of messages, with a column and without one."""
+FOR_EDITORS = ("keys.cdefsrc", "long-line.cdefsrc", "unknown-attribute.cdefsrc", "numbers.cdefsrc", "repeated.cdefsrc")
 
-    SOURCES = ("keys.cdefsrc", "long-line.cdefsrc", "unknown-attribute.cdefsrc", "numbers.cdefsrc", "repeated.cdefsrc")
+
+def findings_and_messages(test):
+    """What editors are tried with: findings with their files, and what is printed of them."""
+    status, text, messages = check("--format", "json", *FOR_EDITORS)
+    test.assertEqual((status, messages), (1, ""))
+    findings = [(each["file"], found) for each in json.loads(text) for found in each["findings"]]
+    test.assertIn(None, [found["column"] for _, found in findings if found["severity"] == "warning"])
+    return findings, check(*FOR_EDITORS)[2]
+
+
+class Editors(unittest.TestCase):
+    """What the files for editors make of messages, with a column and without one; for vim see cdef_check_vim_test.py."""
 
     def setUp(self):
-        status, text, self.messages = check("--format", "json", *self.SOURCES)
-        self.assertEqual((status, self.messages), (1, ""))
-        self.findings = [(each["file"], found) for each in json.loads(text) for found in each["findings"]]
-        self.assertIn(None, [found["column"] for _, found in self.findings if found["severity"] == "warning"])
-        _, _, self.messages = check(*self.SOURCES)
+        self.findings, self.messages = findings_and_messages(self)
 
     def test_vscode(self):
         package = json.loads((EDITORS / "vscode/package.json").read_text())
@@ -141,23 +146,6 @@ class Editors(unittest.TestCase):
             for file, each in self.findings
         ]
         self.assertEqual(found, wanted)
-
-    @unittest.skipUnless(shutil.which("vim"), "there is no vim")
-    def test_vim(self):
-        with tempfile.TemporaryDirectory() as name:
-            directory = pathlib.Path(name)
-            (directory / "messages").write_text(self.messages + "empty.cdefsrc: error: No classes defined [S301]\n")
-            list_all = "map(getqflist(), {_, each -> [bufname(each.bufnr), each.lnum, each.col, each.type, each.valid]})"
-            commands = (f"set rtp^={EDITORS}/vim", "compiler cdef", f"cgetfile {directory}/messages",
-                        f"call writefile([json_encode({list_all})], '{directory}/list')", "qa!")
-            subprocess.run(["vim", "-Nu", "NONE", "-i", "NONE", "-es", *(f"-c{each}" for each in commands)],
-                           stdin=subprocess.DEVNULL, check=True, timeout=60, cwd=CASES)
-            listed = json.loads((directory / "list").read_text())
-        kinds = {"E": "error", "e": "error", "W": "warning", "w": "warning"}
-        found = [(file, line, column, kinds[kind]) for file, line, column, kind, valid in listed if valid and kind in kinds]
-        wanted = [(file, each["line"], each["column"] or 0, each["severity"]) for file, each in self.findings]
-        self.assertEqual(found, wanted + [("empty.cdefsrc", 0, 0, "error")])
-        self.assertEqual(sum(kind in "Nn" and valid for *_, kind, valid in listed), self.messages.count(": note: "))
 
 
 class StandardInput(unittest.TestCase):
@@ -187,9 +175,9 @@ class StandardInput(unittest.TestCase):
         self.assertEqual(check("-", stdin=directory), (2, "", DIRECTORY.replace(".:", "-:")))
 
 
-def main():
-    """Run the tests."""
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+def main(title=__doc__):
+    """Run the tests of the program that was started."""
+    parser = argparse.ArgumentParser(description=title.splitlines()[0])
     parser.add_argument("--cdef", required=True, type=lambda text: pathlib.Path(text).resolve())
     parser.parse_args(namespace=OPTIONS)
     unittest.main(argv=[sys.argv[0]])

@@ -9,6 +9,7 @@ import json
 import os
 import pathlib
 import re
+import shutil
 import socket
 import subprocess
 import sys
@@ -17,6 +18,7 @@ import unittest
 
 import documents
 import golden
+from cases import as_nobody
 
 OPTIONS = argparse.Namespace()
 HERE = pathlib.Path(__file__).resolve().parent
@@ -210,11 +212,20 @@ class Input(unittest.TestCase):
     def test_empty_name(self):
         self.assertEqual(verify(""), (2, "", "cdef: : No such file or directory\n"))
 
-    @unittest.skipIf(os.geteuid() == 0, "root may read everything")
     def test_file_without_permission(self):
-        with tempfile.NamedTemporaryFile() as file:
-            os.chmod(file.name, 0)
-            self.assertEqual(verify(file.name), (2, "", f"cdef: {file.name}: Permission denied\n"))
+        """Whoever may read everything becomes another user, who has to reach the program."""
+        with tempfile.TemporaryDirectory() as directory:
+            os.chmod(directory, 0o755)
+            program = shutil.copy(OPTIONS.cdef, directory)
+            file = pathlib.Path(directory) / "closed.cdef"
+            file.write_bytes((OPTIONS.images / SOUND).read_bytes())
+            os.chmod(file, 0)
+            result = subprocess.run(
+                [program, "verify", file], preexec_fn=as_nobody, stdin=subprocess.DEVNULL, capture_output=True,
+                text=True, check=False, timeout=60,
+            )
+        outcome = (result.returncode, result.stdout, result.stderr)
+        self.assertEqual(outcome, (2, "", f"cdef: {file}: Permission denied\n"))
 
     def test_no_file_named(self):
         status, text, messages = verify()
@@ -298,7 +309,6 @@ class Usage(unittest.TestCase):
                 self.assertEqual((result.returncode, result.stdout, result.stderr), expected)
 
 
-@unittest.skipUnless(pathlib.Path("/dev/full").exists(), "a device that is always full is needed")
 class FullDevice(unittest.TestCase):
     """Output that cannot be written."""
 

@@ -23,20 +23,10 @@ import termios
 
 import faults_mistakes
 from cases import ATTRIBUTE, BEFORE, BLOCK, HEAD, OUT, SKIPPED, SOURCE, TIMEOUT, Cases, Skip
-from cases import attributes, check, expect, limit, only_zeros
-
-NOBODY = 65534
+from cases import as_nobody, attributes, check, expect, limit, only_zeros
 
 case = Cases()
 case.functions.update(faults_mistakes.case.functions)
-
-
-def as_nobody():
-    """In the child: another user, if this one is root."""
-    if os.geteuid() == 0:
-        os.setgroups([])
-        os.setgid(NOBODY)
-        os.setuid(NOBODY)
 
 
 def of_errno(number):

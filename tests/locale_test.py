@@ -18,7 +18,7 @@ PersistentResourceAttribute
 	DataType=%s
 	VarietyRange=1,2
 	DefaultValue=0.5
-	ValidValue=1.25,-2.5e-3
+	ValidValue=-2.5e-3,1.25
 DynamicResourceAttribute
 	Name=Measured%d
 	Description=5

@@ -9,7 +9,6 @@ import json
 import os
 import pathlib
 import re
-import shutil
 import socket
 import subprocess
 import sys
@@ -18,7 +17,6 @@ import unittest
 
 import documents
 import golden
-from cases import as_nobody
 
 OPTIONS = argparse.Namespace()
 HERE = pathlib.Path(__file__).resolve().parent
@@ -211,21 +209,6 @@ class Input(unittest.TestCase):
 
     def test_empty_name(self):
         self.assertEqual(verify(""), (2, "", "cdef: : No such file or directory\n"))
-
-    def test_file_without_permission(self):
-        """Whoever may read everything becomes another user, who has to reach the program."""
-        with tempfile.TemporaryDirectory() as directory:
-            os.chmod(directory, 0o755)
-            program = shutil.copy(OPTIONS.cdef, directory)
-            file = pathlib.Path(directory) / "closed.cdef"
-            file.write_bytes((OPTIONS.images / SOUND).read_bytes())
-            os.chmod(file, 0)
-            result = subprocess.run(
-                [program, "verify", file], preexec_fn=as_nobody, stdin=subprocess.DEVNULL, capture_output=True,
-                text=True, check=False, timeout=60,
-            )
-        outcome = (result.returncode, result.stdout, result.stderr)
-        self.assertEqual(outcome, (2, "", f"cdef: {file}: Permission denied\n"))
 
     def test_no_file_named(self):
         status, text, messages = verify()

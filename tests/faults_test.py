@@ -1,4 +1,4 @@
-"""Faults of the system: what cdgen does when files fail it.
+"""Faults of the system: what the programs do when files fail them.
 
 Every case is a function below, named for what it shows.  Whatever happens, the
 program ends with a status of its own, never by a signal; and a fault before
@@ -267,6 +267,16 @@ def source_shortened_to_whole_stanzas_while_read(world):
     check((status, stderr) == (0, b""), "status", status, stderr)
     check(world.read() == good, "another database")
     world.verified()
+
+
+@case
+def database_unreadable(world):
+    """Nobody may read what cdef is to verify."""
+    world.write(OUT, world.good())
+    os.chmod(world.path(OUT), 0)
+    world.cdef = shutil.copy(world.cdef, world.directory)  # where any user can reach it
+    result = world.inspect("verify", OUT, preexec_fn=as_nobody)
+    expect(result, 2, os.fsencode(f"cdef: {OUT}: ") + of_errno(errno.EACCES) + b"\n")
 
 
 # ---- The output --------------------------------------------------------------

@@ -24,9 +24,12 @@ struct check_options {
 };
 
 std::vector<std::string> warning_names() {
-    std::vector<std::string> names = {"all"};
-    for (const warning &known : check::warnings)
-        names.insert(names.end(), {known.name, known.code});
+    std::vector<std::string> names;
+    names.emplace_back("all");
+    for (const warning &known : check::warnings) {
+        names.emplace_back(known.name);
+        names.emplace_back(known.code);
+    }
     return names;
 }
 

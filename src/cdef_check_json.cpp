@@ -29,12 +29,17 @@ void add_place(json &to, const place &at) {
 }
 
 json json_of(const finding &found) {
-    json data = {{"code", found.code}, {"severity", level_of(found)}, {"name", found.name}, {"message", found.text}};
+    json data;
+    data["code"] = found.code;
+    data["severity"] = level_of(found);
+    data["name"] = found.name;
+    data["message"] = found.text;
     add_place(data, found.at);
     data["source"] = found.source;
     data["notes"] = json::array();
     for (const note &more : found.notes) {
-        json entry = {{"message", more.text}};
+        json entry;
+        entry["message"] = more.text;
         add_place(entry, more.at);
         data["notes"].push_back(std::move(entry));
     }
@@ -46,13 +51,14 @@ json json_of(const finding &found) {
 std::string as_json(std::span<const result> checked) {
     json all = json::array();
     for (const result &each : checked) {
-        json findings = json::array();
+        json entry;
+        entry["file"] = each.file;
+        entry["errors"] = each.errors;
+        entry["warnings"] = each.warnings;
+        entry["findings"] = json::array();
         for (const finding &found : each.findings)
-            findings.push_back(json_of(found));
-        all.push_back({{"file", each.file},
-                       {"errors", each.errors},
-                       {"warnings", each.warnings},
-                       {"findings", std::move(findings)}});
+            entry["findings"].push_back(json_of(found));
+        all.push_back(std::move(entry));
     }
     return json_text(all);
 }
@@ -84,7 +90,8 @@ size_t characters(std::string_view source, size_t bytes) {
 }
 
 json region_of(const place &at, std::string_view source) {
-    json region = {{"startLine", at.line}};
+    json region;
+    region["startLine"] = at.line;
     if (at.column == 0)
         return region;
     region["startColumn"] = source.empty() ? at.column : characters(source, at.column - 1) + 1;
@@ -93,10 +100,12 @@ json region_of(const place &at, std::string_view source) {
 }
 
 json location_of(const std::string &file, const place &at, std::string_view source) {
-    json physical = {{"artifactLocation", {{"uri", uri_of(file)}}}};
+    json location;
+    json &physical = location["physicalLocation"];
+    physical["artifactLocation"]["uri"] = uri_of(file);
     if (at.line != 0)
         physical["region"] = region_of(at, source);
-    return {{"physicalLocation", std::move(physical)}};
+    return location;
 }
 
 /* The line that a note stands at, as far as it is known. */
@@ -107,11 +116,14 @@ std::string_view source_of(const note &more, const finding &found) {
 }
 
 json sarif_of(const std::string &file, const finding &found) {
-    json entry = {{"ruleId", found.code}, {"level", level_of(found)}, {"message", {{"text", found.text}}}};
-    entry["locations"] = json::array({location_of(file, found.at, found.source)});
+    json entry;
+    entry["ruleId"] = found.code;
+    entry["level"] = level_of(found);
+    entry["message"]["text"] = found.text;
+    entry["locations"].push_back(location_of(file, found.at, found.source));
     for (const note &more : found.notes) {
         json related = location_of(file, more.at, source_of(more, found));
-        related["message"] = {{"text", more.text}};
+        related["message"]["text"] = more.text;
         entry["relatedLocations"].push_back(std::move(related));
     }
     return entry;
@@ -119,27 +131,41 @@ json sarif_of(const std::string &file, const finding &found) {
 
 json rules() {
     json all = json::array();
-    for (const message &known : messages)
-        all.push_back({{"id", known.code}, {"shortDescription", {{"text", known.text}}}});
-    for (const warning &known : warnings)
-        all.push_back({{"id", known.code}, {"name", known.name}, {"shortDescription", {{"text", known.title}}}});
+    for (const message &known : messages) {
+        json rule;
+        rule["id"] = known.code;
+        rule["shortDescription"]["text"] = known.text;
+        all.push_back(std::move(rule));
+    }
+    for (const warning &known : warnings) {
+        json rule;
+        rule["id"] = known.code;
+        rule["name"] = known.name;
+        rule["shortDescription"]["text"] = known.title;
+        all.push_back(std::move(rule));
+    }
     return all;
 }
 
 } // namespace
 
 std::string as_sarif(std::span<const result> checked) {
-    json results = json::array();
+    json driver;
+    driver["name"] = "cdef check";
+    driver["version"] = CDGEN_VERSION;
+    driver["rules"] = rules();
+    json run;
+    run["tool"]["driver"] = std::move(driver);
+    run["columnKind"] = "unicodeCodePoints";
+    run["results"] = json::array();
     for (const result &each : checked)
         for (const finding &found : each.findings)
-            results.push_back(sarif_of(each.file, found));
-    json driver = {{"name", "cdef check"}, {"version", CDGEN_VERSION}, {"rules", rules()}};
-    json run = {{"tool", {{"driver", std::move(driver)}}},
-                {"columnKind", "unicodeCodePoints"},
-                {"results", std::move(results)}};
-    return json_text({{"$schema", "https://json.schemastore.org/sarif-2.1.0.json"},
-                      {"version", "2.1.0"},
-                      {"runs", json::array({std::move(run)})}});
+            run["results"].push_back(sarif_of(each.file, found));
+    json log;
+    log["$schema"] = "https://json.schemastore.org/sarif-2.1.0.json";
+    log["version"] = "2.1.0";
+    log["runs"].push_back(std::move(run));
+    return json_text(log);
 }
 
 } // namespace cdef::check

@@ -85,7 +85,9 @@ std::string suggestion(std::string_view text, const name_list &names) {
     std::string_view meant = near_miss(text, names);
     if (!meant.empty())
         return "did you mean " + quoted(meant) + "?";
-    return names.empty() || names.size() > LISTED_MAX ? std::string() : "known are " + listed(names);
+    if (names.empty() || names.size() > LISTED_MAX)
+        return {};
+    return "known are " + listed(names);
 }
 
 name_list stanza_names() {

@@ -91,11 +91,12 @@ void unknown_name(noting &n) {
     if (given.ends_with(' ') || given.ends_with('\t'))
         if (find_attr(n.table(), std::string_view(given).substr(0, given.find_last_not_of(" \t") + 1)) != nullptr)
             return n.add(n.found.at, "blanks in front of the = belong to the name");
-    vx_uint32_t others = kinds_with(n.marked());
-    if (near_miss(n.marked(), attribute_names(n.table())).empty() && std::has_single_bit(others))
+    vx_uint32_t others = kinds_with(given);
+    name_list known = attribute_names(n.table());
+    if (near_miss(given, known).empty() && std::has_single_bit(others))
         n.add(n.found.at, belongs_to(others));
     else
-        n.add(n.found.at, suggestion(n.marked(), attribute_names(n.table())));
+        n.add(n.found.at, suggestion(given, known));
 }
 
 void too_early(noting &n) {

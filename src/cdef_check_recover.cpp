@@ -22,6 +22,10 @@ void close_record(cdgen &cx, int kind) {
     memcpy(sc_tables[index_of(kind)].sc_cb(cx), &none, sizeof none);
 }
 
+bool is_header(std::string_view name) {
+    return set_table_id(std::string(name).c_str()) >= 0;
+}
+
 void complete_element(cdgen &cx) {
     cx.sd_name_found = cx.sd_desc_found = cx.sd_disp_found = cx.sd_dt_found = 1;
 }
@@ -228,8 +232,9 @@ void session::give_up_map() {
 std::string_view session::header_meant(const attr_text &text, const fatal_exit &failure) const {
     const message &known = message_of(failure);
     bool whole = is_message(known, "S103") || is_message(known, "S102");
-    return whole ? near_miss({text.name, static_cast<size_t>(text.end - text.name)}, stanza_names())
-                 : std::string_view();
+    if (!whole)
+        return {};
+    return near_miss({text.name, static_cast<size_t>(text.end - text.name)}, stanza_names());
 }
 
 /* A header with blanks in front. */
@@ -255,7 +260,7 @@ bool session::take_stripped(finding &found, std::string_view name) {
         found.notes.push_back({all_of_line(), "the line ends with a carriage return, which belongs to the name; "
                                               "further ones are passed over"});
     }
-    if (name.size() == length || set_table_id(std::string(name).c_str()) < 0)
+    if (name.size() == length || !is_header(name))
         return false;
     take_header(again(name), false);
     return true;
@@ -273,8 +278,7 @@ void session::unknown_header(const attr_text &text, const fatal_exit &failure) {
         found.notes.push_back({all_of_line(), "this is the rest of a line of more than 253 characters"});
         return;
     }
-    bool attribute = name.find('=') != std::string_view::npos &&
-                     set_table_id(std::string(name.substr(0, name.find('='))).c_str()) < 0;
+    bool attribute = name.find('=') != std::string_view::npos && !is_header(name.substr(0, name.find('=')));
     if (attribute && kind >= 0) {
         found.notes.push_back({all_of_line(), "an attribute line begins with a blank or a tab"});
         std::string indented = std::string("\t").append(name);

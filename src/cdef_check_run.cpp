@@ -50,12 +50,11 @@ finding &session::error(const fatal_exit &failure, const place &at) {
     return out.findings.back();
 }
 
-bool session::warn(warning_id id, const place &at, std::string text, std::vector<note> notes) {
-    return warn_at(id, at, raw, std::move(text), std::move(notes));
+bool session::warn(warning_id id, const place &at, std::string text, note more) {
+    return warn_at(id, at, raw, std::move(text), std::move(more));
 }
 
-bool session::warn_at(warning_id id, const place &at, const std::string &source, std::string text,
-                      std::vector<note> notes) {
+bool session::warn_at(warning_id id, const place &at, const std::string &source, std::string text, note more) {
     const warning &known = warnings[id];
     if (!wanted[id])
         return false;
@@ -65,7 +64,9 @@ bool session::warn_at(warning_id id, const place &at, const std::string &source,
                             .text = std::move(text),
                             .at = at,
                             .source = source,
-                            .notes = std::move(notes)});
+                            .notes = {}});
+    if (!more.text.empty())
+        out.findings.back().notes.push_back(std::move(more));
     ++out.warnings;
     return true;
 }

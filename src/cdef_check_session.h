@@ -153,9 +153,9 @@ struct session {
     attr_text again(std::string_view text);
 
     finding &error(const fatal_exit &failure, const place &at);
-    bool warn(warning_id id, const place &at, std::string text, std::vector<note> notes = {});
-    bool warn_at(warning_id id, const place &at, const std::string &source, std::string text,
-                 std::vector<note> notes = {});
+    /* With a note, if it has a text. */
+    bool warn(warning_id id, const place &at, std::string text, note more = {});
+    bool warn_at(warning_id id, const place &at, const std::string &source, std::string text, note more = {});
 
     /* Places of the current line. */
     place here(mark_kind kind, const fatal_exit *failure = nullptr) const;

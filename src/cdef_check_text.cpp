@@ -63,7 +63,10 @@ std::string as_text(const result &checked) {
     std::string text;
     for (const finding &found : checked.findings) {
         text += prefix(checked.file, found.at) + (found.error ? "error: " : "warning: ") + visible(found.text) + " [" +
-                found.code + (found.error ? "" : std::string(" ") + found.name) + "]\n";
+                found.code;
+        if (!found.error)
+            text.append(" ").append(found.name);
+        text += "]\n";
         text += excerpt(found.at, found.source);
         for (const note &more : found.notes) {
             text += prefix(checked.file, more.at) + "note: " + visible(more.text) + "\n";

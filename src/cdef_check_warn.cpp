@@ -82,8 +82,10 @@ static name_list unchecked_missing(session &check) {
 void session::watch_complete() {
     name_list names = unchecked_missing(*this);
     const stanza_note &stanza = stanzas[index_of(kind)];
-    if (names.empty() || !warn_at(INCOMPLETE, stanza.header, stanza.source,
-                                  quoted(sc_tables[index_of(kind)].sc_name) + " lacks " + listed(names)))
+    if (names.empty())
+        return;
+    std::string text = quoted(sc_tables[index_of(kind)].sc_name) + " lacks " + listed(names);
+    if (!warn_at(INCOMPLETE, stanza.header, stanza.source, std::move(text)))
         return;
     if (is_sd_kind(kind))
         index_missing = stanza.header.line;
@@ -128,7 +130,7 @@ void session::watch_header(int new_kind) {
             warn(CUT_SHORT, all_of_line(),
                  "a second class ends the latest " + quoted(sc_tables[index_of(each)].sc_name) +
                      " unchecked and without its defaults",
-                 {{stanzas[index_of(each)].header, "begun here"}});
+                 {stanzas[index_of(each)].header, "begun here"});
     }
     for (known_values &known : seen.known) {
         known.names.clear();
@@ -151,7 +153,7 @@ void session::watch_permission(std::string_view text, const place &at) {
                              [&](const valid_perms_t &each) { return each.permission == text[0]; });
     if (!known)
         warn(PERMISSION, at, "no permission has this letter, so that none is needed",
-             {{at, "the letters are q, l, e, v, d, c, s, o, a and x"}});
+             {at, "the letters are q, l, e, v, d, c, s, o, a and x"});
     else if (text.size() > 1)
         warn(PERMISSION, at, "only the first letter of a Permission counts");
 }
@@ -163,7 +165,7 @@ void session::watch_element_type(std::string_view text, const place &at) {
     if (cx.attr_dflt_val != nullptr && (unknown || text == "SBS"))
         odd_elements.push_back({at, std::string(text), raw});
     else if (unknown)
-        warn(ELEMENT_TYPE, at, "unknown data type: the element gets none", {{at, type_suggestion(text, true)}});
+        warn(ELEMENT_TYPE, at, "unknown data type: the element gets none", {at, type_suggestion(text, true)});
 }
 
 void session::watch_attribute() {
@@ -230,7 +232,7 @@ void session::watch_variable_class(std::string_view text, const place &at) {
 void session::watch_first(warning_id id, int &first, const place &at, const char *what) {
     if (first != 0)
         warn(id, at, "another " + quoted(sc_tables[index_of(kind)].sc_name) + " has the same " + what,
-             {{{first, 0, 0}, "first given here"}});
+             {{first, 0, 0}, "first given here"});
     else
         first = cx.linenum;
 }
@@ -241,7 +243,7 @@ void session::watch_range() {
         return;
     if (kind == SC_DYNAMIC_CLASS_ATTRIBUTE && cx.cb_rsrc_dattr.ra_cb_ID != 0)
         warn(RANGE_ELSEWHERE, at, "this Range goes to the `DynamicResourceAttribute` that is still open",
-             {{stanzas[SC_DYNAMIC_RESOURCE_ATTRIBUTE].header, "begun here"}});
+             {stanzas[SC_DYNAMIC_RESOURCE_ATTRIBUTE].header, "begun here"});
     else
         seen.ranges.push_back({at, kind, raw});
 }
@@ -259,7 +261,7 @@ void session::ranges_settled(bool resource_was_open, bool class_was_open, int ne
         if (range.kind != completed && !lost)
             warn_at(RANGE_ELSEWHERE, range.at, range.source,
                     "this Range is lost: a " + quoted(sc_tables[index_of(completed)].sc_name) + " is completed first",
-                    {{stanzas[index_of(completed)].header, "begun here"}});
+                    {stanzas[index_of(completed)].header, "begun here"});
     seen.ranges.clear();
 }
 
@@ -287,7 +289,7 @@ void session::watch_variable_classes() {
             continue;
         bool search = (searched += defined.size()) <= SEARCHED_MAX;
         warn_at(UNKNOWN_VARIABLE_CLASS, named.at, named.source, "no `ResourceVariableClass` has this name",
-                {{named.at, search ? suggestion(named.text, defined) : std::string()}});
+                {named.at, search ? suggestion(named.text, defined) : std::string()});
     }
 }
 
@@ -299,11 +301,9 @@ void session::watch_end() {
     if (seen.locator && !attributes.has(seen.locator->text))
         warn_at(UNKNOWN_LOCATOR, seen.locator->at, seen.locator->source,
                 "no `PersistentResourceAttribute` has this name",
-                {{seen.locator->at, suggestion(seen.locator->text, attributes.all())}});
+                {seen.locator->at, suggestion(seen.locator->text, attributes.all())});
     if (!seen.variable_class_unnamed)
         watch_variable_classes();
-    for (finding &found : out.findings)
-        std::erase_if(found.notes, [](const note &each) { return each.text.empty(); });
 }
 
 } // namespace cdef::check

@@ -56,9 +56,15 @@ std::string line_of(const difference &d, bool one_class, bool with_reason) {
 }
 
 json json_of(const difference &d) {
-    json data = {{"change", name_of(d.what)}, {"path", json::array()}};
-    for (auto part = d.path.begin() + (d.path.size() > 1 ? 1 : 0); part != d.path.end(); ++part)
-        data["path"].push_back({{"kind", (*part)->kind}, {"name", (*part)->name}});
+    json data;
+    data["change"] = name_of(d.what);
+    data["path"] = json::array();
+    for (auto part = d.path.begin() + (d.path.size() > 1 ? 1 : 0); part != d.path.end(); ++part) {
+        json entry;
+        entry["kind"] = (*part)->kind;
+        entry["name"] = (*part)->name;
+        data["path"].push_back(std::move(entry));
+    }
     if (d.what == change::changed) {
         data["field"] = d.before->field;
         data["before"] = d.before->text;

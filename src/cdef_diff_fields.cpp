@@ -177,14 +177,16 @@ std::string text_of_bits(std::uint32_t bits, std::span<const props_t> known) {
     }
     if (bits != 0)
         appendf(text, text.empty() ? "0x%x" : "+0x%x", bits);
-    return text.empty() ? "none" : text;
+    if (text.empty())
+        text = "none";
+    return text;
 }
 
 std::string text_of_number(std::uint32_t number, form as) {
     std::string text;
     switch (as) {
     case form::number:
-        return std::to_string(number);
+        break;
     case form::identifier:
         return std::to_string(static_cast<std::int32_t>(number));
     case form::bits:
@@ -195,16 +197,22 @@ std::string text_of_number(std::uint32_t number, form as) {
     case form::data_type:
         return std::string(cdb::name_of(static_cast<vx_data_type_t>(number)));
     case form::variable_type:
-        return number < std::size(vxVarStr) ? vxVarStr[number] : std::to_string(number);
+        if (number < std::size(vxVarStr))
+            return vxVarStr[number];
+        break;
     case form::permission:
         return text_of_permission(number);
     case form::element_index:
     case form::locator:
-        return number == 0xFFFF ? "none" : std::to_string(number);
+        if (number == 0xFFFF)
+            return "none";
+        break;
     case form::reference:
-        return number == CDB_NONE ? "0" : std::to_string(number);
+        if (number == CDB_NONE)
+            return "0";
+        break;
     }
-    return text;
+    return std::to_string(number);
 }
 
 } // namespace cdef

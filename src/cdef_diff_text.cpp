@@ -114,7 +114,7 @@ std::string teller::text_of_elements(const cdb::value &value, const cdb::bytes &
             text += std::string(cdb::name_of(element.type())) + " ";
         text += text_of(element, strings);
     }
-    return structured ? "{" + text + "}" : "[" + text + "]";
+    return (structured ? "{" : "[") + text + (structured ? "}" : "]");
 }
 
 std::string teller::text_of(const cdb::value &value, const cdb::bytes &strings) {

@@ -197,7 +197,9 @@ void walker::show_value(const label &what, const cdb::value &value, std::size_t 
         return out.add(what, fact_of(value));
     std::string type(cdb::name_of(value.type()));
     cdb::value_list elements = value.elements();
-    std::string title = what.title == type ? type : what.title + ": " + type;
+    std::string title = what.title;
+    if (title != type)
+        title += ": " + type;
     out.open_list({what.key, title + (elements.empty() ? ", empty" : "")});
     std::size_t element_size = value.type() == VX_SD_PTR ? sizeof(vx_structured_data_element_t) : sizeof(vx_value_t);
     std::size_t element_at = strings + *value.place() + cdb::value::ELEMENTS;

@@ -159,7 +159,7 @@ template <class NameOf> words names_of(std::uint32_t set, NameOf name_of) {
 words properties(std::span<const props_t> table, std::uint32_t set) {
     return names_of(set, [table](std::uint32_t bit) {
         auto found = std::find_if(table.begin(), table.end(), [bit](const props_t &p) { return p.p == bit; });
-        return found == table.end() ? std::string() : std::string(found->s);
+        return std::string(found == table.end() ? "" : found->s);
     });
 }
 
@@ -167,7 +167,10 @@ words permissions(std::uint32_t set) {
     return names_of(set, [](std::uint32_t bit) {
         const auto *found = std::find_if(std::begin(perm_list), std::end(perm_list),
                                          [bit](const valid_perms_t &p) { return p.mask == bit; });
-        return found == std::end(perm_list) ? std::string() : std::string(1, found->permission);
+        std::string letter;
+        if (found != std::end(perm_list))
+            letter = found->permission;
+        return letter;
     });
 }
 
@@ -177,7 +180,9 @@ fact mark(std::uint32_t number) {
     for (int shift = 24; shift >= 0; shift -= 8)
         characters += static_cast<char>(number >> shift & 0xFF);
     bool readable = std::all_of(characters.begin(), characters.end(), [](char c) { return c > ' ' && c <= '~'; });
-    return readable ? fact(word{characters}) : fact(bits{number});
+    if (readable)
+        return word{characters};
+    return bits{number};
 }
 
 fact time(std::uint32_t seconds) {
@@ -202,7 +207,9 @@ fact version(std::uint32_t number) {
 }
 
 template <class Name> fact name_in(std::span<const Name> names, std::uint32_t number) {
-    return number < names.size() ? fact(word{std::string(names[number])}) : fact(bits{number});
+    if (number < names.size())
+        return word{std::string(names[number])};
+    return bits{number};
 }
 
 fact number_or_none(std::uint32_t number, std::uint32_t no_number) {

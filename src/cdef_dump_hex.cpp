@@ -117,12 +117,17 @@ vx_resource_handle_t handle_at(const cdb::bytes &file, std::size_t at) {
 std::string hex_form::meaning_of_value(const cdb::region &r, vx_data_type_t type) {
     const cdb::bytes &strings = tables(r).strings;
     cdb::value value(db.file(), r.offset, type, strings);
+    if (!cdb::is_out_of_line(type) && !value.present())
+        return "";
     if (!cdb::is_out_of_line(type))
-        return value.present() ? as_text(fact_of(value)) : "";
+        return as_text(fact_of(value));
     auto word = db.file().number<std::uint32_t>(r.offset);
     if (word == CDB_NONE)
         return "none";
-    return place_text(strings, word) + (type == VX_CHAR_PTR && value.present() ? " " + excerpt(strings, word) : "");
+    std::string shown = place_text(strings, word);
+    if (type == VX_CHAR_PTR && value.present())
+        shown += " " + excerpt(strings, word);
+    return shown;
 }
 
 std::string hex_form::meaning_of_reference(const cdb::region &r) {
@@ -138,7 +143,10 @@ std::string hex_form::meaning_of_reference(const cdb::region &r) {
         return place_text(into.section, word);
     if (r.what->to != cdb::target::strings)
         return place_text(lists_of(into, r.what->to), word);
-    return place_text(into.strings, word) + (word < into.strings.size() ? " " + excerpt(into.strings, word) : "");
+    std::string shown = place_text(into.strings, word);
+    if (word < into.strings.size())
+        shown += " " + excerpt(into.strings, word);
+    return shown;
 }
 
 std::string hex_form::meaning_of_field(const cdb::region &r) {
@@ -146,7 +154,9 @@ std::string hex_form::meaning_of_field(const cdb::region &r) {
     case cdb::field_kind::number: {
         meaning as = meaning_of(r.record, *r.what);
         std::uint32_t number = number_in(db.file(), start_of(r), *r.what);
-        return as == meaning::OFFSET ? place_text(db.file(), number) : as_text(fact_of(as, number));
+        if (as == meaning::OFFSET)
+            return place_text(db.file(), number);
+        return as_text(fact_of(as, number));
     }
     case cdb::field_kind::reference:
         return meaning_of_reference(r);
@@ -175,7 +185,9 @@ std::string hex_form::meaning_in(const cdb::region &r) {
 
 /* "section 2, rsrc_pattr_t 5, ra_props", as cdef verify calls it. Only records are counted. */
 std::string name_of(const cdb::region &r) {
-    std::string name = r.section ? "section " + std::to_string(*r.section) + ", " : "";
+    std::string name;
+    if (r.section)
+        name += "section " + std::to_string(*r.section) + ", ";
     name += r.record;
     if (r.what != nullptr || r.record == "vx_value_t" || r.record == "var_id_t")
         name += " " + std::to_string(r.index);
@@ -198,7 +210,7 @@ void hex_form::show(const cdb::region &r) {
             out.text += " " + hex_of(line.subspan(i, 1));
         if (at == 0) {
             out.text.resize(start + BYTES_A_LINE * 3, ' ');
-            out.text += "  " + name_of(r) + (meaning.empty() ? "" : ": " + meaning);
+            out.text += "  " + name_of(r) + (meaning.empty() ? "" : ": ") + meaning;
         }
         out.text += '\n';
         out.flush_if_full();

@@ -63,24 +63,36 @@ json json_of(const words &w) {
     return w.list;
 }
 json json_of(binary b) {
-    return {{"bytes", hex_of(b.bytes)}};
+    json data;
+    data["bytes"] = hex_of(b.bytes);
+    return data;
 }
 json json_of(text t) {
     return is_utf8(t.bytes) ? json(t.bytes) : json_of(binary{std::as_bytes(std::span(t.bytes))});
 }
 json json_of(const vx_resource_handle_t &h) {
-    return {{"header", h.header}, {"id", {h.id.id1, h.id.id2, h.id.id3, h.id.id4}}};
+    json data;
+    data["header"] = h.header;
+    for (std::uint32_t part : {h.id.id1, h.id.id2, h.id.id3, h.id.id4})
+        data["id"].push_back(part);
+    return data;
 }
 json json_of(const named &n) {
     bool known = !n.kind.empty();
-    return {{"number", n.number},
-            {"kind", known ? json(n.kind) : json()},
-            {"name", known ? json_of(text{n.name}) : json()}};
+    json data;
+    data["number"] = n.number;
+    data["kind"] = known ? json(n.kind) : json();
+    data["name"] = known ? json_of(text{n.name}) : json();
+    return data;
 }
 json json_of(const checksum &c) {
+    json data;
+    data["correct"] = c.found.empty();
     if (c.found.empty())
-        return {{"correct", true}};
-    return {{"correct", false}, {"found", c.found}, {"expected", c.expected}};
+        return data;
+    data["found"] = c.found;
+    data["expected"] = c.expected;
+    return data;
 }
 
 /* Writes groups as it meets them. Facts, however many members they have, take a line each. */

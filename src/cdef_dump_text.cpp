@@ -96,7 +96,9 @@ std::string text_of(const words &w) {
     std::string joined;
     for (const std::string &item : w.list)
         joined += (joined.empty() ? "" : ", ") + item;
-    return joined.empty() ? "none" : joined;
+    if (joined.empty())
+        return "none";
+    return joined;
 }
 std::string text_of(text t) {
     return quoted(t.bytes);
@@ -111,10 +113,14 @@ std::string text_of(const vx_resource_handle_t &h) {
 }
 std::string text_of(const named &n) {
     std::string shown = std::to_string(n.number) + ", ";
-    return shown + (n.kind.empty() ? "unknown" : std::string(n.kind) + " " + quoted(n.name));
+    if (n.kind.empty())
+        return shown + "unknown";
+    return shown.append(n.kind) + " " + quoted(n.name);
 }
 std::string text_of(const checksum &c) {
-    return c.found.empty() ? "correct" : "wrong, " + c.found + " in the place of " + c.expected;
+    if (c.found.empty())
+        return "correct";
+    return "wrong, " + c.found + " in the place of " + c.expected;
 }
 
 /* One fact a line, two blanks a level. */

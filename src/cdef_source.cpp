@@ -29,13 +29,17 @@ constexpr std::string_view HEADING =
 
 /* ---- The class ------------------------------------------------------------------------------------------------- */
 
+bool can_be_given(std::string_view name, std::string_view value) {
+    return attribute_line(name, value).has_value();
+}
+
 /* The compiler takes the first persistent attribute of the name that a Locator gives, and the low half of its Id. */
 std::string locator_name(const cdb::resource_class &c) {
     std::unordered_set<std::string_view> seen;
     for (const cdb::persistent_attribute &attr : c.persistent_attributes(cdb::level::of_resource)) {
         bool first = seen.insert(attr.name()).second;
         if (first && static_cast<std::uint16_t>(attr.id()) == c.record().rc_locator &&
-            attribute_line("Locator", attr.name()))
+            can_be_given("Locator", attr.name()))
             return std::string(attr.name());
     }
     no_source(place_of("ResourceClass", c.name()), "its locator is the Id of no persistent attribute");
@@ -47,7 +51,7 @@ bool has_all_required(const rsrc_class_t &rc) {
 }
 
 bool can_be_named(const cdb::resource_class &c) {
-    return has_all_required(c.record()) && attribute_line("Name", c.name()).has_value();
+    return has_all_required(c.record()) && can_be_given("Name", c.name());
 }
 
 /* A name that no line gives can only come from the output file's. */
@@ -68,13 +72,15 @@ void write_class_properties(source_writer &out, const rsrc_class_t &rc, const st
     std::string names;
     std::uint32_t bits = rc.rc_props;
     for (const props_t &p : rc_props) {
-        names += (bits & p.p) != 0 ? std::string(names.empty() ? "" : ",") + p.s : "";
+        if ((bits & p.p) == 0)
+            continue;
+        names.append(names.empty() ? "" : ",").append(p.s);
         bits &= ~p.p;
     }
     if (bits != 0)
         no_source(place, "no property has bit " + std::to_string(bits));
     if (!names.empty() || has_all_required(rc))
-        out.line("Properties", names.empty() ? "," : names);
+        out.line("Properties", names.empty() ? std::string_view(",") : names);
 }
 
 void write_resource_class(source_writer &out, const class_plan &plan) {

@@ -444,10 +444,11 @@ void planner::use(const way &w) {
     for (std::uint32_t i = w.last_move; i != 0; i = moves[i].before) {
         const move &m = moves[i];
         const dynamic_attributes &attrs = attributes[m.rsrc_class];
-        if (m.line != given_line::none)
-            classes[m.rsrc_class].of(level_of(m.from))[m.index].range =
-                m.line == given_line::good ? line_value(target_of(attrs, m).wanted, range_of(attrs, m).type)
-                                           : USELESS_VALUE;
+        std::string &value = classes[m.rsrc_class].of(level_of(m.from))[m.index].range;
+        if (m.line == given_line::useless)
+            value = USELESS_VALUE;
+        if (m.line == given_line::good)
+            value = line_value(target_of(attrs, m).wanted, range_of(attrs, m).type);
         auto &slot = places[m.rsrc_class];
         while (slot->from != table::dynamic_attributes && slot->from != table::dynamic_class_attributes)
             ++slot;
@@ -467,7 +468,8 @@ bool planner::run() {
 } // namespace
 
 void plan_ranges(std::vector<class_plan> &classes) {
-    if (!planner(classes, false).run() && !planner(classes, true).run())
+    auto plan = [&](bool any_order) { return planner(classes, any_order).run(); };
+    if (!plan(false) && !plan(true))
         no_source("dynamic attributes", "no choice of Range lines gives all of them their bounds");
 }
 

@@ -157,7 +157,9 @@ void write_late_run(source_writer &out, const attribute_structure &s, const elem
 } // namespace
 
 bool comes_too_late(const cdb::sd_definition &definition, const cdb::value &value, std::uint16_t highest_index) {
-    return !definition.empty() && !fits_definition(definition, types_of(value), highest_index);
+    if (definition.empty())
+        return false;
+    return !fits_definition(definition, types_of(value), highest_index);
 }
 
 void write_run(source_writer &out, std::string_view stanza, const cdb::sd_definition &definition,

@@ -55,6 +55,13 @@ std::string hex_of(std::span<const std::byte> data) {
     return text;
 }
 
+/* A list of one text. */
+std::vector<std::string> only(std::string text) {
+    std::vector<std::string> texts;
+    texts.push_back(std::move(text));
+    return texts;
+}
+
 /* How much of a binary's text stands for itself. */
 enum class plain : std::uint8_t { printable, all };
 
@@ -85,7 +92,7 @@ bool ends_in_zeros(std::span<const std::byte> data) {
 std::vector<std::string> texts_of_binary(std::span<const std::byte> data, bool in_pair) {
     if (data.size() >= LINE_MAX_CHARS)
         return {};
-    std::vector<std::string> texts = {hex_of(data)};
+    std::vector<std::string> texts = only(hex_of(data));
     if (ends_in_zeros(data))
         for (plain which : {plain::printable, plain::all})
             texts.push_back(text_with_escapes(data, which, in_pair));
@@ -97,7 +104,7 @@ std::vector<std::string> texts_of_double(double number) {
     constexpr std::uint64_t QUIET = std::uint64_t{1} << 51;
     if (std::isnan(number) && (std::bit_cast<std::uint64_t>(number) & QUIET) == 0)
         return {};
-    return {text_of_real(number)};
+    return only(text_of_real(number));
 }
 
 bool has_no_bytes(const cdb::value &v) {
@@ -128,18 +135,18 @@ std::vector<std::string> texts_of(const cdb::value &value, bool in_pair) {
     switch (value.type()) {
     case VX_INT32:
     case VX_INT64:
-        return {std::to_string(value.integer())};
+        return only(std::to_string(value.integer()));
     case VX_UINT32:
     case VX_UINT64:
-        return {std::to_string(value.natural())};
+        return only(std::to_string(value.natural()));
     case VX_FLOAT32:
-        return {text_of_real(static_cast<float>(value.real()))};
+        return only(text_of_real(static_cast<float>(value.real())));
     case VX_FLOAT64:
         return texts_of_double(value.real());
     case VX_CHAR_PTR:
         if (in_pair && value.text().find(',') != std::string_view::npos)
             return {};
-        return {std::string(value.text().substr(0, LINE_MAX_CHARS))};
+        return only(std::string(value.text().substr(0, LINE_MAX_CHARS)));
     case VX_BINARY_PTR:
         return texts_of_binary(value.binary(), in_pair);
     default:
@@ -194,7 +201,7 @@ void source_writer::stanza(std::string_view kind, std::string place) {
 }
 
 void source_writer::line(std::string_view name, std::string_view value) {
-    line_of_any(name, {std::string(value)});
+    line_of_any(name, only(std::string(value)));
 }
 
 void source_writer::line(std::string_view name, std::int64_t number) {

@@ -27,7 +27,9 @@ const char *name_of(cdb::severity level) {
 
 /* "section 2, rsrc_pattr_t 5, u_ra_name": as much of it as is known. */
 std::string place_of(const cdb::finding &f) {
-    std::string place = f.section ? "section " + std::to_string(*f.section) : "file";
+    std::string place = "file";
+    if (f.section)
+        place = "section " + std::to_string(*f.section);
     if (!f.record.empty())
         place += ", " + std::string(f.record) + " " + std::to_string(f.index);
     if (!f.field.empty())
@@ -45,11 +47,18 @@ std::string line_of(const std::string &file, const cdb::finding &f) {
 }
 
 json json_of(const cdb::finding &f) {
-    return {{"code", f.broken->code},   {"severity", name_of(f.broken->level)},
-            {"title", f.broken->title}, {"section", f.section ? json(*f.section) : json()},
-            {"record", f.record},       {"index", f.index},
-            {"field", f.field},         {"offset", f.offset},
-            {"found", f.found},         {"expected", f.expected}};
+    json data;
+    data["code"] = f.broken->code;
+    data["severity"] = name_of(f.broken->level);
+    data["title"] = f.broken->title;
+    data["section"] = f.section ? json(*f.section) : json();
+    data["record"] = f.record;
+    data["index"] = f.index;
+    data["field"] = f.field;
+    data["offset"] = f.offset;
+    data["found"] = f.found;
+    data["expected"] = f.expected;
+    return data;
 }
 
 /* What is said of one file, and whether it passes. */
@@ -61,7 +70,10 @@ struct verdict {
 
 verdict judge(const std::string &path, const verify_options &options) {
     input in(path);
-    verdict v = {.text = {}, .data = {{"file", path}, {"sound", true}, {"findings", json::array()}}};
+    verdict v;
+    v.data["file"] = path;
+    v.data["sound"] = true;
+    v.data["findings"] = json::array();
     for (const cdb::finding &f : cdb::verify(in.db)) {
         bool counts = f.broken->level == cdb::severity::error || options.warnings_count;
         v.passes = v.passes && !counts;

@@ -10,13 +10,6 @@ namespace cdef::check {
 
 namespace {
 
-const char *name_of(vx_data_type_t type) {
-    for (size_t i = 0; i < std::size(vxTypeMap); ++i)
-        if (vxTypeMap[i] == type)
-            return vxTypeStr[i];
-    return "UNKNOWN";
-}
-
 const char *form_of(vx_data_type_t type) {
     switch (scalar_vx(type)) {
     case VX_INT32:
@@ -45,8 +38,7 @@ struct noting {
     int kind; /* of the stanza at fault; -1: none */
 
     void add(const place &at, std::string text) {
-        if (!text.empty())
-            found.notes.push_back({at, std::move(text)});
+        found.notes.push_back({at, std::move(text)});
     }
     /* For an error without a place of its own: the line is shown. */
     void show(const mention &shown, std::string text) {
@@ -151,12 +143,10 @@ void bad_value(noting &n) {
     bool numeric = scalar_vx(type) >= VX_INT32 && scalar_vx(type) <= VX_FLOAT64;
     if (numeric && check.overflow_line != 0)
         overflowed(n);
-    else if (type == VX_UNKNOWN && n.stanza().data_type.at.line != 0)
-        n.add(n.stanza().data_type.at, "unknown data type: " + type_suggestion(n.stanza().data_type.text, true));
     else if (type == VX_UNKNOWN)
-        n.add(n.found.at, "the stanza has no known DataType");
+        n.add(n.stanza().data_type.at, "unknown data type: " + type_suggestion(n.stanza().data_type.text, true));
     else
-        n.add(n.found.at, quoted(name_of(type)) + " takes " + form_of(type));
+        n.add(n.found.at, quoted(vxTypeStr[type]) + " takes " + form_of(type));
 }
 
 void wrong_index(noting &n) {
@@ -171,13 +161,7 @@ void wrong_index(noting &n) {
         n.add({check.index_missing, 0, 0}, "this " + quoted(n.table().sc_name) + " lacks `ElementIndex`");
 }
 
-void second_manager(noting &n) {
-    n.first_given(n.check.manager_line);
-}
-
 void bad_default(noting &n) {
-    if (n.kind < 0)
-        return;
     if (!is_sd_kind(n.kind))
         n.show(n.stanza().data_type, "the DataType of this " + quoted(n.table().sc_name));
     else
@@ -205,12 +189,12 @@ struct noting_of {
 };
 
 constexpr noting_of notings[] = {
-    {"S102", no_stanza},       {"S106", unknown_name},     {"S108", too_early},      {"S109", repeated},
-    {"S110", no_sd_attribute}, {"S111", incomplete},       {"S112", no_class},       {"S113", no_class},
-    {"S114", no_class},        {"S115", no_class},         {"S116", no_class},       {"S117", no_class},
-    {"S118", second_map},      {"S201", unknown_property}, {"S202", unknown_type},   {"S203", unknown_variable_type},
-    {"S207", bad_value},       {"S210", wrong_index},      {"S213", second_manager}, {"S214", bad_default},
-    {"S215", bad_default},     {"S216", bad_default},      {"S303", no_manager},     {"S304", keys},
+    {"S102", no_stanza},       {"S106", unknown_name},     {"S108", too_early},    {"S109", repeated},
+    {"S110", no_sd_attribute}, {"S111", incomplete},       {"S112", no_class},     {"S113", no_class},
+    {"S114", no_class},        {"S115", no_class},         {"S116", no_class},     {"S117", no_class},
+    {"S118", second_map},      {"S201", unknown_property}, {"S202", unknown_type}, {"S203", unknown_variable_type},
+    {"S207", bad_value},       {"S210", wrong_index},      {"S214", bad_default},  {"S215", bad_default},
+    {"S216", bad_default},     {"S303", no_manager},       {"S304", keys},
 };
 
 } // namespace

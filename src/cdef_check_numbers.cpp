@@ -199,12 +199,10 @@ void session::watch_valid(std::string_view text) {
     watch_bounds();
 }
 
-/* Values that fit their type; others have been warned of. */
+/* Two values that fit their type; others have been warned of. */
 void session::watch_bounds() {
     std::string_view text = value_text();
     pair_of_texts both(text);
-    if (!both.two())
-        return;
     bool variety = cx.latest.attr->ta_type == AT_VARIETY;
     vx_data_type_t type = variety ? VX_UINT32 : scalar_vx(data_type(cx));
     bool above = false;

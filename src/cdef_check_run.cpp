@@ -124,8 +124,6 @@ void session::note_given() {
     int &given = stanzas[index_of(kind)].given[at];
     if (given == 0)
         given = cx.linenum;
-    if (cx.latest.attr->ta_type == AT_MANAGER)
-        manager_line = cx.linenum;
     if (kind == SC_CLASS_TO_MANAGER_MAPPING)
         map_values.push_back({value_part(0, cx.latest.length), cx.latest.attr->ta_name, raw});
     if (cx.latest.attr->ta_type == AT_SD_INDEX)

@@ -223,8 +223,7 @@ struct session {
     bool rest_of_line = false;            /* the current line goes on with the one before */
     int map_line = 0;
     std::vector<mention> map_values; /* by the names of their attributes */
-    int manager_line = 0;
-    cdb_ref_t nobody = {}; /* what refers to the elements of a run that belongs to nothing */
+    cdb_ref_t nobody = {};           /* what refers to the elements of a run that belongs to nothing */
     std::array<stanza_note, SC_COUNT> stanzas;
     watch seen;
 };

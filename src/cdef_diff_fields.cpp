@@ -197,9 +197,7 @@ std::string text_of_number(std::uint32_t number, form as) {
     case form::data_type:
         return std::string(cdb::name_of(static_cast<vx_data_type_t>(number)));
     case form::variable_type:
-        if (number < std::size(vxVarStr))
-            return vxVarStr[number];
-        break;
+        return vxVarStr[number]; /* an unknown one is an error */
     case form::permission:
         return text_of_permission(number);
     case form::element_index:

@@ -72,8 +72,8 @@ void builder::add_text(thing &to, const cdb::field &f, std::string_view text) {
 
 void builder::add_value(thing &to, const cdb::field &f, const cdb::value &value, const cdb::bytes &strings) {
     bool bound = f.name == "ra_min_value" || f.name == "ra_max_value";
-    to.facts.push_back(
-        {f.name, label_of(f).words, bound ? tell.text_of_bound(value, strings) : tell.text_of(value, strings)});
+    std::string text = bound ? tell.text_of_bound(value, strings) : tell.text_of(value, strings);
+    to.facts.push_back({f.name, label_of(f).words, std::move(text)});
 }
 
 void builder::add_varieties(thing &to, const cdb::variety_list &varieties) {
@@ -107,7 +107,7 @@ void builder::add_elements(thing &to, const cdb::field &f, const cdb_ref_t &ref,
 
 void builder::add_reference(thing &to, const cdb::field &f, const cdb_ref_t &ref, const cdb::class_tables &tables,
                             vx_data_type_t type) {
-    if (label_of(f).as == form::reference)
+    if (label_of(f).as == form::reference || f.to == cdb::target::section || f.to == cdb::target::none)
         return add_number(to, {}, f, ref.offset[0]);
     switch (f.to) {
     case cdb::target::strings:
@@ -116,11 +116,8 @@ void builder::add_reference(thing &to, const cdb::field &f, const cdb_ref_t &ref
         return add_varieties(to, cdb::varieties_at(tables, ref));
     case cdb::target::valid_vals:
         return add_valid_values(to, cdb::valid_values_at(tables, ref, type), tables);
-    case cdb::target::sd_defs:
+    default: /* definitions */
         return add_elements(to, f, ref, tables);
-    case cdb::target::section:
-    case cdb::target::none:
-        return add_number(to, {}, f, ref.offset[0]);
     }
 }
 

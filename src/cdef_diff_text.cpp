@@ -141,8 +141,6 @@ std::string teller::text_of(const cdb::value &value, const cdb::bytes &strings) 
         return hex_of(value.binary());
     case VX_RSRC_HANDLE_PTR:
         return text_of_handle(value.handle());
-    case VX_SBS_PTR:
-        return "structured bytes";
     default:
         return text_of_elements(value, strings);
     }

@@ -286,7 +286,7 @@ fact fact_of(meaning as, std::uint32_t number) {
     case MANAGER:
     case OFFSET:
     case UNUSED:
-        return std::uint64_t{number};
+        break;
     }
     return std::uint64_t{number};
 }
@@ -309,10 +309,8 @@ fact fact_of(const cdb::value &value) {
         return text{value.text()};
     case VX_BINARY_PTR:
         return binary{value.binary()};
-    case VX_RSRC_HANDLE_PTR:
+    default: /* of those with elements these are facts of their own */
         return value.handle();
-    default:
-        return none{};
     }
 }
 

@@ -57,13 +57,12 @@ std::size_t start_of(const cdb::region &r) {
     return r.offset - r.what->offset;
 }
 
+/* Of a region in a section: values and references stand nowhere else. */
 const cdb::class_tables &hex_form::tables(const cdb::region &r) {
-    static const cdb::class_tables none = {};
-    if (!r.section || *r.section >= sections.size())
-        return none;
-    std::optional<cdb::class_tables> &known = sections[*r.section];
+    std::size_t section = r.section.value();
+    std::optional<cdb::class_tables> &known = sections.at(section);
     if (!known)
-        known = tables_of(db, *r.section);
+        known = tables_of(db, section);
     return *known;
 }
 
@@ -164,7 +163,7 @@ std::string hex_form::meaning_of_field(const cdb::region &r) {
         return meaning_of_value(r, value_type(r));
     case cdb::field_kind::reserved:
     case cdb::field_kind::entries:
-        return "";
+        break;
     }
     return "";
 }

@@ -96,7 +96,7 @@ struct class_plan {
     const std::vector<dynamic_plan> &of(cdb::level level) const {
         return dynamic[static_cast<std::size_t>(level)];
     }
-    std::size_t count(table t) const;
+    std::size_t count(table of_records) const;
     /* A class that follows in the source ends this one while the last attribute of each kind is still open: it is
      * written as it is, without the checks and defaults of its completion. */
     bool is_cut_short(const step &s) const {

@@ -115,24 +115,11 @@ void put_last(class_plan &plan) {
 
 } // namespace
 
-std::size_t class_plan::count(table t) const {
-    switch (t) {
-    case table::persistent_class_attributes:
-        return view.record().rc_num_pattrsC;
-    case table::dynamic_class_attributes:
-        return view.record().rc_num_dattrsC;
-    case table::persistent_attributes:
-        return view.record().rc_num_pattrs;
-    case table::dynamic_attributes:
-        return view.record().rc_num_dattrs;
-    case table::class_actions:
-        return view.record().rc_num_actionsC;
-    case table::actions:
-        return view.record().rc_num_actions;
-    case table::inputs:
-        break;
-    }
-    return class_inputs.size();
+std::size_t class_plan::count(table of_records) const {
+    constexpr vx_uint16_t rsrc_class_t::*counts[RECORD_TABLES] = {
+        &rsrc_class_t::rc_num_pattrsC, &rsrc_class_t::rc_num_dattrsC,  &rsrc_class_t::rc_num_pattrs,
+        &rsrc_class_t::rc_num_dattrs,  &rsrc_class_t::rc_num_actionsC, &rsrc_class_t::rc_num_actions};
+    return view.record().*counts[static_cast<std::size_t>(of_records)];
 }
 
 void plan_order(class_plan &plan) {

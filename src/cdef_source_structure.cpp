@@ -34,9 +34,8 @@ element_types types_of(const cdb::value &value) {
     return found;
 }
 
+/* Both have as many elements. */
 bool same_types(const std::vector<vx_data_type_t> &types, const cdb::sd_definition &definition) {
-    if (types.size() != definition.size())
-        return false;
     for (std::size_t i = 0; i < types.size(); ++i)
         if (types[i] != definition[i].type())
             return false;
@@ -53,8 +52,8 @@ std::optional<std::size_t> indices_given(std::size_t elements, std::uint16_t hig
 }
 
 /* Which elements go without an ElementIndex: the last ones that can. Only an element that has one can have valid
- * values. */
-std::vector<bool> indexed_elements(const cdb::sd_definition &definition, std::size_t given, const std::string &place) {
+ * values; of those there are at most as many as are given one. */
+std::vector<bool> indexed_elements(const cdb::sd_definition &definition, std::size_t given) {
     std::vector<bool> indexed(definition.size(), true);
     std::size_t without = definition.size() - given;
     for (std::size_t i = definition.size(); i > 0 && without > 0; --i) {
@@ -63,8 +62,6 @@ std::vector<bool> indexed_elements(const cdb::sd_definition &definition, std::si
             --without;
         }
     }
-    if (without > 0)
-        no_source(place, "more elements with valid values than with an ElementIndex");
     return indexed;
 }
 
@@ -140,7 +137,7 @@ void write_own_run(source_writer &out, const attribute_structure &s, const eleme
     if (!same_types(value.types, s.definition))
         write_replaced_run(out, s, value, value.types.size(), place);
     std::size_t given = require_indices(s.definition.size(), s.highest_index, place);
-    write_indexed_run(out, s.stanza, s.definition, indexed_elements(s.definition, given, place), place);
+    write_indexed_run(out, s.stanza, s.definition, indexed_elements(s.definition, given), place);
 }
 
 /* The value, if there is one, and the highest index are those of an earlier run. */

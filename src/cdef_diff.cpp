@@ -59,10 +59,10 @@ json json_of(const difference &d) {
     json data;
     data["change"] = name_of(d.what);
     data["path"] = json::array();
-    for (auto part = d.path.begin() + (d.path.size() > 1 ? 1 : 0); part != d.path.end(); ++part) {
+    for (const thing *t : std::span(d.path).subspan(1)) { /* the first is the database */
         json entry;
-        entry["kind"] = (*part)->kind;
-        entry["name"] = (*part)->name;
+        entry["kind"] = t->kind;
+        entry["name"] = t->name;
         data["path"].push_back(std::move(entry));
     }
     if (d.what == change::changed) {

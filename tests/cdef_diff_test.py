@@ -29,6 +29,7 @@ import cdef_cases
 TESTS = pathlib.Path(__file__).parent
 sys.path.insert(0, str(TESTS / "image"))
 
+import cdb_image  # noqa: E402
 import make_images  # noqa: E402  (the path has to be set first)
 
 CASES = TESTS / "cdef" / "diff"
@@ -363,6 +364,78 @@ def json_says_the_same(programs, problems):
     expect(problems, "same", (status, json.loads(text)), (0, []))
 
 
+def json_of_what_is_new_and_of_the_database(programs, problems):
+    """A thing of its own has a path of its own, the database an empty one; what breaks nothing has no reason."""
+    one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
+    two = programs.compile(class_source(attribute("A", 1), head="\tName=C\n"), "two.cdef")
+    programs.patch(two, 12, b"\7")
+    path = [{"kind": "ResourceClass", "name": "'C'"}, {"kind": "PersistentResourceAttribute", "name": "'A'"}]
+    status, text, _ = programs.diff("--json", one, two)
+    sequence = int.from_bytes([7, 0, 0, 0], sys.byteorder)
+    changed = {"change": "changed", "path": [], "field": "cdb_hdr_seqno", "before": "0", "after": str(sequence)}
+    expect(problems, "diff", (status, json.loads(text)), (1, [changed, {"change": "added", "path": path}]))
+
+
+def references_that_are_never_set_may_be_none(programs, problems):
+    """None is no other place than 0, where they lead by default."""
+    for order in make_images.ORDERS:
+        # Of a dynamic attribute of the class, which stands at 368, and of the manager, at 1328.
+        one, two = programs.image("small", order), programs.image("small", order, "u32 392 -1", "u32 1344 -1")
+        expect(problems, order, programs.diff(one, two), (0, "", ""))
+        three = programs.image("small", order, "u32 392 24")
+        text = "~ DynamicClassAttribute 'dc': u_ra_next_in_vclass 0 -> 24\n"
+        expect(problems, f"{order}, another place", programs.diff(two, three), (1, text, ""))
+
+
+def sections_of_unused_types_pair_by_type(programs, problems):
+    """Their contents are not compared, but that they are there."""
+    for order in make_images.ORDERS:
+        one = programs.image("sections", order)
+        two = programs.image("sections", order, "u32 112 2", "u32 192 9")  # the third anchor's type, and contents
+        text = "- section of type 1\n+ section of type 2\n"
+        expect(problems, order, programs.diff(one, two), (1, text, ""))
+
+
+# The last attribute of a class that another one cuts short seems to have the valid values of the first one, which are
+# numbers; read as texts all of them lead to its name.
+SAME_TEXT = """
+include common.inc
+section class
+rsrc_class_t:1 $CLASS rc_locator=0 u_rc_pattrsC=224 u_rc_dattrsC=224 u_rc_pattrs=224 u_rc_dattrs=368
++ u_rc_actionsC=368 u_rc_actions=368 u_rc_variety_lists=368 u_rc_sd_defs=400 u_rc_valid_vals=400
++ u_rc_strings={strings} rc_num_pattrs=2 rc_varlist_size=32 rc_valval_size={size}
+rsrc_pattr_t:9 $PATTR u_ra_name=8 ra_data_type=UInt32 u_ra_valid_vals=0
+rsrc_pattr_t:9 $PATTR u_ra_name={second} ra_data_type=String u_ra_variety_list=16 u_ra_valid_vals=0
+variety_list_t:g 0,1
+variety_list_t:g 0,2
+valid_values_t:5{values}
+string "C"
+string "{name}"
+string "Cut"
+section class
+rsrc_class_t:1 $CLASS $EMPTY
+string "D"
+include tail.inc
+"""
+
+
+def same_text(count, length):
+    """A database in which so many values lead to a text of so many characters; with its NUL it takes a multiple of 8."""
+    size = 8 + 24 * count
+    places = {"strings": 400 + size, "size": size, "second": 8 + length + 1}
+    text = SAME_TEXT.format(values=" UInt32:8,UInt32:8" * count, name="n" * length, **places)
+    return cdb_image.assemble(text, sys.byteorder, sys.byteorder, TESTS / "golden")
+
+
+def values_that_lead_to_one_text_too_often_are_refused(programs, problems):
+    """What would be told is out of proportion to the file; but not that they do."""
+    (programs.directory / "few.cdef").write_bytes(same_text(10, 32767))
+    expect(problems, "few", programs.diff("few.cdef", "few.cdef"), (0, "", ""))
+    (programs.directory / "many.cdef").write_bytes(same_text(100, 32767))
+    message = "cdef: many.cdef: values or texts that lead to the same place too often\n"
+    expect(problems, "many", programs.diff("many.cdef", "many.cdef"), (2, "", message))
+
+
 def one_may_be_standard_input(programs, problems):
     """Either of the two, but not both."""
     one = programs.compile(class_source(attribute("A", 1), head="\tName=C\n"), "one.cdef")
@@ -411,6 +484,10 @@ CHECKS = [
     records_that_are_never_written_are_compared,
     places_in_a_class_hash_are_not_compared,
     json_says_the_same,
+    json_of_what_is_new_and_of_the_database,
+    references_that_are_never_set_may_be_none,
+    sections_of_unused_types_pair_by_type,
+    values_that_lead_to_one_text_too_often_are_refused,
     one_may_be_standard_input,
     what_is_tolerated_is_told,
     trouble_is_status_2,

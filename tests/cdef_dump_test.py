@@ -440,6 +440,17 @@ def case_texts_are_escaped():
         expect(hidden, [], "characters that a terminal would act upon")
 
 
+def case_texts_of_several_lines():
+    """No source makes one, but a file may have it."""
+    source = (CASES / "listing" / "minimal.cdefsrc").read_bytes()
+    source += b"PersistentResourceAttribute\n\tName=A\n\tDescription=3\n\tDisplayName=4\n\tId=7\n"
+    source += b'\tDataType=String\n\tVarietyRange=0,10\n\tDefaultValue="one?two"\n'
+    data = with_checksum(compile_source(source).replace(b"one?two", b"one\ntwo"))
+    expect(re.findall(r"ra_dflt_value: (.*)", dump(data)), [r'"one\ntwo"'], "listing")
+    expect(parsed(dump(data, "--json"))["sections"][0]["class"]["persistent_resource_attributes"][0]["ra_dflt_value"],
+           "one\ntwo", "JSON")
+
+
 def case_numbers_in_json():
     """Integers are exact, floats have their digits, what JSON has no number for is text."""
     text = dump(database("types"), "--json")
@@ -484,6 +495,14 @@ def case_class_hash():
     data = parsed(dump(image.finish()[0], "--json", "--offsets"))["sections"][0]["class_hash"]
     expect(data["u_rch_table"], [0] * 1024, "buckets")
     expect([block["u_rch_next_hash"] for block in data["rc_hash_blocks"]], [1, 5], "references")
+    names = [name for _, _, name in regions_of(dump(image.finish()[0], "--hex"))]
+    for name in (
+        "section 0, rsrc_class_hash_t 0, u_rch_table",
+        "section 0, rc_hash_block_t 0, u_rch_next_hash: 1",
+        "section 0, rc_hash_block_t 1, u_rch_rsrc_class: 8",
+        "section 0, rc_hash_block_t 1, rch_class_id: 7",
+    ):
+        expect(names.count(name), 1, f"annotations {name!r} in {names[-8:]}")
 
 
 def case_sections_of_unused_types():

@@ -23,6 +23,10 @@ import cdef_sources
 import golden
 
 TESTS = pathlib.Path(__file__).parent
+sys.path.insert(0, str(TESTS / "image"))
+
+import make_images  # noqa: E402  (the path has to be set first)
+
 CASES = TESTS / "cdef" / "source"
 GENERATED_GROUPS = 6
 GENERATED_EACH = 50
@@ -185,7 +189,74 @@ def check_terminal(programs):
     return problems
 
 
+def refusals(programs, what, database, why):
+    """The problems of a database that has no source, for this reason."""
+    with tempfile.TemporaryDirectory() as name:
+        result = programs.source(pathlib.Path(name), database)
+    actual = (result.returncode, result.stdout, result.stderr.decode())
+    return [] if actual == (TROUBLE, b"", f"cdef: {DATABASE}: no source: {why}\n") else [f"{what}: {actual}"]
+
+
+def check_sections(programs):
+    """Of a type that the compiler does not make, or with a revision."""
+    problems = []
+    for order in make_images.ORDERS:
+        plain = make_images.assemble(TESTS / "image" / "hash.image", order)
+        problems += refusals(programs, order, plain, "section 0: no source makes one of type 7")
+        unused = make_images.assemble(TESTS / "image" / "sections.image", order)
+        problems += refusals(programs, order, unused, "section 1: no source makes one of type 0")
+        revised = bytearray(make_images.assemble(TESTS / "image" / "small.image", order))
+        make_images.change(revised, "put", "u32 92 3", order)  # the first anchor's
+        make_images.settle(revised, order, [])
+        problems += refusals(programs, order, revised, "section 0: no source gives it a revision")
+    return problems
+
+
+# A class that another one cuts short, with an attribute that has no type.
+CUT_SHORT = """
+include common.inc
+section class
+rsrc_class_t:1 $CLASS u_rc_pattrsC=224 u_rc_dattrsC=224 u_rc_pattrs=224 u_rc_dattrs={dynamic}
++ u_rc_actionsC={end} u_rc_actions={end} u_rc_variety_lists={end} u_rc_sd_defs={lists} u_rc_valid_vals={lists}
++ u_rc_strings={lists} {count}=1 rc_varlist_size=16 rc_locator=0
+{record} u_ra_name=8 ra_props=0 ra_group_id=0 {field}
+variety_list_t:g 0,10
+string "C"
+string "A"
+string "Text"
+section class
+rsrc_class_t:1 $CLASS $EMPTY
+string "D"
+include tail.inc
+"""
+PERSISTENT = {"record": "rsrc_pattr_t:9 $PATTR", "count": "rc_num_pattrs", "dynamic": 296, "end": 296, "lists": 312}
+DYNAMIC = {"record": "rsrc_dattr_t:a $DATTR", "count": "rc_num_dattrs", "dynamic": 224, "end": 360, "lists": 376}
+OPTIONAL = ("ra_props=0x20", "ra_group_id=1", "ra_group_msgid=2")
+CONDITIONS = ("u_ra_express=16", "u_ra_rearm_expr=16", "ra_expr_desc=3", "ra_rearm_desc=4")
+
+
+def check_optional_fields(programs):
+    """Optional lines may follow only if there is a type and a variety."""
+    problems = []
+    for kind, fields in ((PERSISTENT, OPTIONAL), (DYNAMIC, OPTIONAL + CONDITIONS)):
+        stanza = "Persistent" if kind is PERSISTENT else "Dynamic"
+        why = f"{stanza}ResourceAttribute 'A': optional lines, but no type or no varieties"
+        for order in make_images.ORDERS:
+            database = cdb_image.assemble(CUT_SHORT.format(field="", **kind), order, base_dir=TESTS / "golden")
+            with tempfile.TemporaryDirectory() as name:
+                result = programs.source(pathlib.Path(name), database)
+            if (result.returncode, result.stderr) != (0, b"") or b"DataType" in result.stdout:
+                problems.append(f"{stanza}: {result}")
+            for field in fields:
+                text = CUT_SHORT.format(field=field, **kind)
+                database = cdb_image.assemble(text, order, base_dir=TESTS / "golden")
+                problems += refusals(programs, field, database, why)
+    return problems
+
+
 PROPERTIES = {
+    "sections-that-are-not-made": check_sections,
+    "optional-fields-of-an-attribute-without-a-type": check_optional_fields,
     "on-a-terminal": check_terminal,
     "what-is-tolerated-is-told": check_tolerated,
     "all-golden-sources": lambda programs: check_sources(programs, golden_sources()),

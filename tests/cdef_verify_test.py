@@ -207,6 +207,11 @@ class Input(unittest.TestCase):
     def test_directory(self):
         self.assertEqual(verify("broken"), (2, "", "cdef: broken: Is a directory\n"))
 
+    def test_standard_input_that_is_a_directory(self):
+        directory = os.open(OPTIONS.images, os.O_RDONLY)
+        self.addCleanup(os.close, directory)
+        self.assertEqual(verify("-", stdin=directory), (2, "", "cdef: -: Is a directory\n"))
+
     def test_empty_name(self):
         self.assertEqual(verify(""), (2, "", "cdef: : No such file or directory\n"))
 

@@ -148,6 +148,12 @@ std::string complaint(const CLI::App &app, const CLI::Error &usage) {
     return argument + (app.get_subcommands().empty() ? ": unknown subcommand" : ": one operand too many");
 }
 
+/* No exception: JSON values are destroyed on its way, and that takes memory too. */
+[[noreturn]] void end_without_memory() {
+    std::fputs("cdef: out of memory\n", stderr);
+    std::exit(TROUBLE);
+}
+
 int run(int argc, char **argv) {
     CLI::App app("Shows, checks and compares class definition databases.", "cdef");
     app.set_version_flag("--version", "cdef " CDGEN_VERSION);
@@ -177,16 +183,11 @@ int run(int argc, char **argv) {
 } // namespace cdef
 
 int main(int argc, char **argv) {
+    std::set_new_handler(cdef::end_without_memory);
     try {
-        try {
-            return cdef::run(argc, argv);
-        } catch (const std::bad_alloc &) {
-            throw; /* it has no words of ours */
-        } catch (const std::exception &trouble) {
-            cdef::tell(trouble.what());
-        }
-    } catch (...) {
-        std::fputs("cdef: out of memory\n", stderr);
+        return cdef::run(argc, argv);
+    } catch (const std::exception &trouble) {
+        cdef::tell(trouble.what());
     }
     return cdef::TROUBLE;
 }

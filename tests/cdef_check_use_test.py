@@ -8,6 +8,7 @@ import json
 import os
 import pathlib
 import re
+import shlex
 import socket
 import subprocess
 import sys
@@ -114,6 +115,77 @@ class ManyNames(unittest.TestCase):
         self.assertEqual((status, len(findings), {each["code"] for each in findings}), (0, 1200, {"S505"}))
         self.assertEqual(findings[999]["notes"][0]["message"], "did you mean `Class10999`?")
         self.assertEqual([each["notes"] for each in findings[1000:]], [[]] * 200)
+
+
+class TooManyVariableClasses(unittest.TestCase):
+    """What only the image in the making shows is told of the last line, as all that the end shows."""
+
+    def test_told_at_the_end(self):
+        head, _, tail = (CASES / "variable-class-once.cdefsrc").read_text().partition("ResourceVariableClass\n")
+        attribute, _, tail = tail[tail.index("DynamicResourceAttribute"):].partition("\nDynamicResourceAttribute\n")
+        tail = tail[tail.index("ClassToManagerMapping"):]
+        named = "ResourceVariableClass\n\tVariableClass=V{0}\n\tObservationInterval=1\n\tReportingInterval=1\n"
+        body = ""
+        for number in range(101):
+            unique = attribute.replace("=Vv", f"=V{number}").replace("=A", f"=A{number}").replace("Id=0", f"Id={number}")
+            body += named.format(number) + unique + "\n"
+        message = "error: Too many variable classes with dynamic attributes (100 at most) [S305]\n"
+        with tempfile.TemporaryDirectory() as directory:
+            source, text = pathlib.Path(directory) / "too-many", head + body + tail
+            source.write_text(text)
+            self.assertEqual(check(source), (1, "", f"{source}:{text.count(chr(10))}: {message}"))
+            source.write_text(text.replace("=V100\n", "=V99\n"))
+            self.assertEqual(check(source), (0, "", ""))
+
+
+class Surroundings(unittest.TestCase):
+    """What is no fault of the source: streams and memory."""
+
+    def test_standard_error_that_is_full(self):
+        for source, status in ((ODD, 2), (WRONG, 2), (RIGHT, 0)):
+            with open("/dev/full", "wb") as full:
+                result = subprocess.run([OPTIONS.cdef, "check", source], cwd=CASES, stdout=subprocess.PIPE, stderr=full)
+            self.assertEqual((result.returncode, result.stdout), (status, b""), source)
+
+    def limited(self, kilobytes, *operands):
+        """A run in so much address space."""
+        command = shlex.join([str(OPTIONS.cdef), *map(str, operands)])
+        return subprocess.run(
+            ["sh", "-c", f"ulimit -v {kilobytes} && exec {command}"], capture_output=True, text=True, timeout=60
+        )
+
+    def least_memory(self):
+        """The least address space, in KB, in which the program starts."""
+        low, high = 0, 1 << 20
+        if self.limited(high, "--version").returncode != 0:
+            self.skipTest("the program needs more than 1 GB to start: a sanitizer")
+        while high - low > 64:
+            middle = (low + high) // 2
+            low, high = (low, middle) if self.limited(middle, "--version").returncode == 0 else (middle, high)
+        return high
+
+    def test_memory_that_runs_out(self):
+        """At every level there is either all that is to be told, or a message and the status of trouble; a source that
+        cannot be checked is left out."""
+        head, _, tail = (CASES / "unused-default.cdefsrc").read_text().partition("PersistentClassAttribute\n")
+        attribute, _, tail = tail.partition("ClassToManagerMapping\n")
+        body = "".join("PersistentClassAttribute\n" + attribute.replace("Id=", f"Id={i}") for i in range(10, 4010))
+        ran_out = re.compile(
+            r"cdef: (out of memory|\S+: (\w+: alloc_tble (malloc|realloc) failure|strdup failed|"
+            r"cfg_malloc malloc failure): Cannot allocate memory|\S+: cannot read because: Cannot allocate memory)\n")
+        with tempfile.TemporaryDirectory() as directory:
+            source = pathlib.Path(directory) / "large"
+            source.write_text(head + body + "ClassToManagerMapping\n" + tail)
+            command = ("check", "--format", "json", source)
+            kilobytes, failures, step = self.least_memory(), 0, 64
+            good = subprocess.run([OPTIONS.cdef, *command], capture_output=True, text=True, timeout=60)
+            self.assertIn(good.returncode, (0, 1), good.stderr)
+            while (result := self.limited(kilobytes, *command)).returncode == 2:
+                self.assertIn(result.stdout, ("", "[]\n"), kilobytes)
+                self.assertRegex(result.stderr, ran_out, kilobytes)
+                kilobytes, failures, step = kilobytes + step, failures + 1, step + step // 8
+        self.assertGreater(failures, 5)
+        self.assertEqual((result.returncode, result.stdout), (good.returncode, good.stdout))
 
 
 FOR_EDITORS = ("keys.cdefsrc", "long-line.cdefsrc", "unknown-attribute.cdefsrc", "numbers.cdefsrc", "repeated.cdefsrc")

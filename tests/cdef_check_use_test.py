@@ -117,10 +117,10 @@ class ManyNames(unittest.TestCase):
         self.assertEqual([each["notes"] for each in findings[1000:]], [[]] * 200)
 
 
-class TooManyVariableClasses(unittest.TestCase):
-    """What only the image in the making shows is told of the last line, as all that the end shows."""
+class TooMany(unittest.TestCase):
+    """What only the end of the source shows is told of the last line."""
 
-    def test_told_at_the_end(self):
+    def test_variable_classes(self):
         head, _, tail = (CASES / "variable-class-once.cdefsrc").read_text().partition("ResourceVariableClass\n")
         attribute, _, tail = tail[tail.index("DynamicResourceAttribute"):].partition("\nDynamicResourceAttribute\n")
         tail = tail[tail.index("ClassToManagerMapping"):]
@@ -136,6 +136,17 @@ class TooManyVariableClasses(unittest.TestCase):
             self.assertEqual(check(source), (1, "", f"{source}:{text.count(chr(10))}: {message}"))
             source.write_text(text.replace("=V100\n", "=V99\n"))
             self.assertEqual(check(source), (0, "", ""))
+
+    def test_records_of_one_kind(self):
+        head, _, tail = (CASES / "unused-default.cdefsrc").read_text().partition("PersistentClassAttribute\n")
+        attribute, _, tail = tail.partition("ClassToManagerMapping\n")
+        message = "error: Too many records of one kind in a class (65535 at most): ClassPattrsC [S306]\n"
+        with tempfile.TemporaryDirectory() as directory:
+            source = pathlib.Path(directory) / "too-many"
+            text = head + 65536 * ("PersistentClassAttribute\n" + attribute) + "ClassToManagerMapping\n" + tail
+            source.write_text(text)
+            expected_line = f"{source}:{text.count(chr(10))}: {message}"
+            self.assertEqual(check("--no-warn", "all", source), (1, "", expected_line))
 
 
 class Surroundings(unittest.TestCase):
@@ -177,13 +188,13 @@ class Surroundings(unittest.TestCase):
             source = pathlib.Path(directory) / "large"
             source.write_text(head + body + "ClassToManagerMapping\n" + tail)
             command = ("check", "--format", "json", source)
-            kilobytes, failures, step = self.least_memory(), 0, 64
+            kilobytes, failures, step = self.least_memory(), 0, 128
             good = subprocess.run([OPTIONS.cdef, *command], capture_output=True, text=True, timeout=60)
             self.assertIn(good.returncode, (0, 1), good.stderr)
             while (result := self.limited(kilobytes, *command)).returncode == 2:
                 self.assertIn(result.stdout, ("", "[]\n"), kilobytes)
                 self.assertRegex(result.stderr, ran_out, kilobytes)
-                kilobytes, failures, step = kilobytes + step, failures + 1, step + step // 8
+                kilobytes, failures, step = kilobytes + step, failures + 1, step + step // 4
         self.assertGreater(failures, 5)
         self.assertEqual((result.returncode, result.stdout), (good.returncode, good.stdout))
 

@@ -413,6 +413,7 @@ TEXTS = [
      '"\\xf0\\x9b\\xb2\\xa0\\xf0\\x9d\\x85\\xb3\\xef\\xbe\\xa0\\xef\\xbf\\xb0\\xe1\\x9e\\xb4"',
      "\U0001bca0\U0001d173\uffa0\ufff0\u17b4"),
     ("e\u0301".encode(), '"e\u0301"', "e\u0301"),
+    ("\u0800\u0939".encode(), '"\u0800\u0939"', "\u0800\u0939"),
     (b"\xff", '"\\xff"', {"bytes": "ff"}),
     (b"cut \xe2\x82", '"cut \\xe2\\x82"', {"bytes": "63757420e282"}),
     (b"long \xc0\xaf \xe0\x80\xaf \xf0\x80\x80\xaf", '"long \\xc0\\xaf \\xe0\\x80\\xaf \\xf0\\x80\\x80\\xaf"',

@@ -249,7 +249,7 @@ class Input(unittest.TestCase):
         self.assertEqual(result.stderr.decode(), f"cdef: {directory}/{shown}: wrong checksum\n" * 2)
 
     def test_names_in_brackets(self):
-        names = ["[x]", "[x,y]", "[]", "[[x]]"]
+        names = ["[x]", "[x,y]", "[]", "[[x]]", "[x", "x]", "./x]", "./x"]
         with tempfile.TemporaryDirectory() as directory:
             for name in names:
                 (pathlib.Path(directory) / name).write_bytes((OPTIONS.images / WRONG).read_bytes())

@@ -254,7 +254,60 @@ def check_optional_fields(programs):
     return problems
 
 
+def dynamic_class(fields, of_class=()):
+    """The description of a class with dynamic attributes of the resource, behind some of the class, each with the
+    fields given. An empty text stands at 8 in the strings."""
+    own = 224 + 136 * len(of_class)
+    end = own + 136 * len(fields)
+    lists = end + 16 * (len(of_class) + len(fields))
+    lines = [
+        "include common.inc",
+        "section class",
+        f"rsrc_class_t:1 $CLASS u_rc_pattrsC=224 u_rc_dattrsC=224 u_rc_pattrs={own} u_rc_dattrs={own}",
+        f"+ u_rc_actionsC={end} u_rc_actions={end} u_rc_variety_lists={end} u_rc_sd_defs={lists}",
+        f"+ u_rc_valid_vals={lists} u_rc_strings={lists} rc_num_dattrsC={len(of_class)} rc_num_dattrs={len(fields)}",
+        f"+ rc_varlist_size={lists - end}",
+    ]
+    marks = "8" * len(of_class) + "a" * len(fields)
+    for i, given in enumerate([*of_class, *fields]):
+        lines.append(f"rsrc_dattr_t:{marks[i]} $DATTR u_ra_name={16 + 8 * i} u_ra_variety_list={16 * i}")
+        lines.append(f"+ ra_data_type=Int32 ra_max_value=Int32:100 {given}")
+    lines += ["variety_list_t:g 0,1"] * len(marks) + ['string "C"', 'string ""']
+    return "\n".join([*lines, *(f'string "A{i}"' for i in range(len(marks))), "include tail.inc", ""])
+
+
+def check_choices_that_never_end(programs):
+    """Each ID is in two lists, and no choice brings the last list about: looking for one ends all the same."""
+    ids = [*range(1, 31), *range(1, 31), 40, 41]
+    lists = [[number] for number in range(1, 31)] * 2 + [[41, 40]]
+    text = dynamic_class([f"ra_attr_id={number}" for number in ids])
+    for i, numbers in enumerate(lists):
+        text += f"section varclass\nrsrc_variable_class_t:4 rvc_var_count={len(numbers)} u_rvc_string_tbl=8"
+        text += f' u_rvc_compat_name=none\nstring "V{i}"\nvar_ids {" ".join(map(str, numbers))}\n'
+    why = "variable classes: their lists of IDs do not follow from the dynamic attributes"
+    database = cdb_image.assemble(text, base_dir=TESTS / "golden")
+    return refusals(programs, "choices", database, why)
+
+
+def check_too_many_mixtures(programs):
+    """Of many attributes of both kinds not all ways to mix them are tried; of a few they are."""
+    problems = []
+    astray = "ra_data_type=String ra_init_value=String:8 ra_min_value=String:5 ra_max_value=String:6"
+    few, many = (
+        cdb_image.assemble(dynamic_class([astray] + [""] * (count - 1), [""] * count), base_dir=TESTS / "golden")
+        for count in (3, 200)
+    )
+    with tempfile.TemporaryDirectory() as name:
+        result = programs.source(pathlib.Path(name), few)
+    if (result.returncode, result.stdout.count(b"\tRange=5,6\n"), result.stderr) != (0, 1, b""):
+        problems.append(f"few: {result}")
+    why = "dynamic attributes: no choice of Range lines gives all of them their bounds"
+    return problems + refusals(programs, "many", many, why)
+
+
 PROPERTIES = {
+    "choices-that-never-end": check_choices_that_never_end,
+    "too-many-mixtures": check_too_many_mixtures,
     "sections-that-are-not-made": check_sections,
     "optional-fields-of-an-attribute-without-a-type": check_optional_fields,
     "on-a-terminal": check_terminal,

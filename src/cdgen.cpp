@@ -3,7 +3,6 @@
 #include "cdgen.h"
 
 #include <cerrno>
-#include <csignal>
 #include <cstdio>
 #include <cstdlib>
 #include <new>
@@ -138,18 +137,13 @@ int report(const cdgen &cx, const fatal_exit &failure) {
     return failure.code;
 }
 
-/* A stream that nobody reads and a file that may not grow are errors of the call, not ends of the process. */
-void take_errors_from_calls() {
-    signal(SIGPIPE, SIG_IGN);
-    signal(SIGXFSZ, SIG_IGN);
-}
-
 } // namespace
 
 constinit const std::span<const closing_step> closing_steps = steps;
 
 cdgen::~cdgen() {
     discard_mapfile(*this);
+    set_unfinished_output(nullptr);
     for (tbl_content &content : filed)
         free(content.tbl_base);
 }
@@ -173,7 +167,6 @@ void compile(cdgen &cx) {
 }
 
 int cdgen_main(int argc, char **argv) {
-    take_errors_from_calls();
     cdgen cx;
     try {
         parse_command_line(cx, argc, argv);

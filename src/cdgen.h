@@ -636,6 +636,13 @@ void add_rsrc_var_class_tbls(cdgen &cx);
 /* Unmaps, closes and removes the output file if it is mapped. */
 void discard_mapfile(cdgen &cx);
 
+/* For a program that is the compiler alone (cdgen_process.cpp): what would end it by a signal in the midst of writing
+ * removes the output first; what other programs do to its files and streams, and a lack of memory, end it with a
+ * message and a status. */
+void take_process();
+/* The output that is being written, which must stay where it is; null if there is none. */
+void set_unfinished_output(const char *name);
+
 /* Reverses the byte order of a finished image in place. nowhere: places in the image of words that look like references
  * and are none; they are reversed, but not followed. */
 void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere = {});

@@ -87,17 +87,34 @@ struct output_fd {
     int fd;
 };
 
-/* Emptied only once it is known not to be the source. Asked before it is opened: a source that has been deleted in the
- * meantime may have left its inode number to the new file. */
-int create_output(cdgen &cx) {
+bool is_stream(const struct stat &file, int stream) {
     struct stat st = {};
-    if (stat(cx.cdefname, &st) == 0 && st.st_dev == cx.cdb_fp.device && st.st_ino == cx.cdb_fp.inode)
+    return S_ISREG(file.st_mode) && fstat(stream, &st) == 0 && st.st_dev == file.st_dev && st.st_ino == file.st_ino;
+}
+
+/* Asked before it is opened: a source that has been deleted in the meantime may have left its inode number to the new
+ * file. */
+void refuse_own_files(cdgen &cx) {
+    struct stat st = {};
+    if (stat(cx.cdefname, &st) != 0)
+        return;
+    if (st.st_dev == cx.cdb_fp.device && st.st_ino == cx.cdb_fp.inode)
         bld_error_exit(cx, "Cannot create CDB file: ", "it is the source file", nullptr, 1);
+    if (cx.debugLevel > 0 && (is_stream(st, STDOUT_FILENO) || is_stream(st, STDERR_FILENO)))
+        bld_error_exit(cx, "Cannot create CDB file: ", "traces go there", nullptr, 1);
+}
+
+/* Emptied only once it is known not to be a file that the program uses. */
+int create_output(cdgen &cx) {
+    refuse_own_files(cx);
+    struct stat st = {};
     output_fd out(above_stdio(open(cx.cdefname, O_RDWR | O_CREAT | O_CLOEXEC, 0644)));
     if (out.fd < 0)
         cannot(cx, "Cannot create CDB file: ", errno);
     if (fstat(out.fd, &st) != 0)
         cannot(cx, "Cannot map CDB file: ", errno);
+    if (S_ISREG(st.st_mode))
+        set_unfinished_output(cx.cdefname);
     if (S_ISREG(st.st_mode) && st.st_size > 0 && ftruncate(out.fd, 0) != 0)
         cannot(cx, "Cannot create CDB file: ", errno);
     return out.release();
@@ -158,6 +175,7 @@ void flush_mapfile(cdgen &cx) {
     munmap(std::exchange(cx.cdb_mapfile_ptr, nullptr), cx.gross_file_size);
     int fd = std::exchange(cx.cdb_mapfile_fd, 0);
     [[maybe_unused]] int truncated = ftruncate(fd, final_size);
+    set_unfinished_output(nullptr);
     close(fd);
 }
 

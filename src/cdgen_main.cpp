@@ -3,5 +3,6 @@
 #include "cdgen.h"
 
 int main(int argc, char **argv) {
+    take_process();
     return cdgen_main(argc, argv);
 }

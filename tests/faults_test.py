@@ -399,6 +399,20 @@ def output_is_a_link_to_the_source(world):
 
 
 @case
+def output_takes_the_traces(world):
+    """Traces in a database would damage it; without them, nothing is written to the streams."""
+    for stream in ("stdout", "stderr"):
+        world.write(OUT, BEFORE)
+        with open(world.path(OUT), "ab") as file:
+            refused = world.run("-d", "3", SOURCE, OUT, **{stream: file})
+            check(refused.returncode == 1, "expected 1, actual", refused.returncode)
+            check(world.read().startswith(BEFORE), "the output was touched")
+            check(stream == "stderr" or refused.stderr == b"Cannot create CDB file: traces go there\n", refused.stderr)
+            expect(world.run(SOURCE, OUT, **{stream: file}), 0, **{stream: None})
+        check(world.read() == world.good(), "another database")
+
+
+@case
 def new_output_has_its_mode(world):
     """Mode 0644 but for the umask."""
     expect(world.run(preexec_fn=lambda: os.umask(0o026)), 0)

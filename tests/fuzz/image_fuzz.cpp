@@ -41,6 +41,11 @@ void make_whole(std::span<std::byte> image, std::endian order) {
     put(image, 4, sum, order);
 }
 
+/* A bit of the checksum, which says nothing else, chooses. */
+bool stays_as_it_is(const orb_cdb_header_t &header) {
+    return (header.cdb_hdr_checksum & 0x100) != 0;
+}
+
 void check_regions(const cdb::database &db) {
     std::size_t end = 0;
     for (const cdb::region &r : cdb::regions(db)) {
@@ -78,6 +83,10 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size
         return 0;
     }
     verified(db);
+    if (stays_as_it_is(db.header())) {
+        look_through(db);
+        return 0;
+    }
     make_whole(image.bytes, db.order());
     look_through(cdb::database(image.bytes));
     return 0;

@@ -1,8 +1,9 @@
 /* source_fuzz: compiles arbitrary bytes, and looks through what comes of them.
  *
  * The first byte holds the options: bit 0 n, bits 1 and 2 the level of d, bit 3 s, bit 4 an output whose name no class
- * can take, bit 5 an output that exists. The rest is the source. Whatever it says, the compilation ends with a database
- * or with one of the program's own statuses; a database is sound, and all of it can be read. */
+ * can take, bit 5 an output that exists, bit 6 a source that stands across the end of the read buffer. The rest is the
+ * source. Whatever it says, the compilation ends with a database or with status 1; a database is sound, and all of it
+ * can be read; an error leaves the output as it was. */
 
 #include "cdgen.h"
 #include "fuzz.h"
@@ -15,7 +16,10 @@
 #include <fstream>
 #include <string>
 #include <sys/mman.h>
+#include <sys/stat.h>
 #include <unistd.h>
+#include <utility>
+#include <vector>
 
 namespace {
 
@@ -37,8 +41,14 @@ public:
         rmdir(directory.c_str());
     }
 
-    void write_source(const std::uint8_t *data, std::size_t size) const {
-        bool written = ftruncate(source_fd, 0) == 0 && pwrite(source_fd, data, size, 0) == static_cast<ssize_t>(size);
+    /* Behind so many lines of comment. */
+    void write_source(const std::uint8_t *data, std::size_t size, std::size_t lines) const {
+        std::string text;
+        for (std::size_t i = 0; i < lines; ++i)
+            text += COMMENT;
+        text.append(reinterpret_cast<const char *>(data), size);
+        bool written = ftruncate(source_fd, 0) == 0 &&
+                       pwrite(source_fd, text.data(), text.size(), 0) == static_cast<ssize_t>(text.size());
         fuzz::require(written, "the source cannot be written");
     }
 
@@ -47,6 +57,8 @@ public:
     }
 
     std::string source;
+
+    static constexpr std::string_view COMMENT = "#23456789012345678901234567890123456789012345678901234567890123\n";
 
 private:
     static std::string make_directory() {
@@ -67,26 +79,27 @@ int probe() {
     return fd;
 }
 
-/* The status, as the driver has it. */
-int compile_one(unsigned options, const std::string &source, const std::string &output) {
-    cdgen cx;
-    cx.interactive = (options & 1) == 0;
-    cx.debugLevel = static_cast<int>(options >> 1 & 3);
-    cx.swap_endianness = static_cast<int>(options >> 3 & 1);
-    cx.cdefsrc = source.c_str();
-    cx.cdefname = output.c_str();
-    try {
-        compile(cx);
-    } catch (const fatal_exit &failure) {
-        fuzz::require(failure.code == 1 && failure.msg != nullptr && *failure.msg != '\0', "another status than 1");
-        return failure.code;
-    }
-    return 0;
+/* The status that the program ends with. */
+int compile_one(unsigned options, std::string source, std::string output) {
+    std::string program = "cdgen", letters = "-d0";
+    letters.back() = static_cast<char>('0' + (options >> 1 & 3));
+    std::string n = "-n", s = "-s";
+    std::vector<char *> arguments = {program.data(), letters.data()};
+    if ((options & 1) != 0)
+        arguments.push_back(n.data());
+    if ((options & 8) != 0)
+        arguments.push_back(s.data());
+    arguments.insert(arguments.end(), {source.data(), output.data(), nullptr});
+    return cdgen_main(static_cast<int>(arguments.size()) - 1, arguments.data());
 }
 
-/* A mapping takes long to see, so it is looked for now and then only. */
+/* A mapping takes long to see, so a fuzzer looks for it now and then only; a replay, always. */
 void expect_no_mapping() {
+#ifdef CDGEN_FUZZ
     constexpr unsigned NOW_AND_THEN = 1024;
+#else
+    constexpr unsigned NOW_AND_THEN = 1;
+#endif
     static unsigned runs = 0;
     if (++runs % NOW_AND_THEN != 0)
         return;
@@ -94,6 +107,28 @@ void expect_no_mapping() {
     for (std::string line; std::getline(maps, line);)
         fuzz::require(line.find("/memfd:source") == std::string::npos && line.find("/cdgen-fuzz-") == std::string::npos,
                       "a file stayed mapped");
+}
+
+/* What can be seen of a file if it was touched. */
+struct file_state {
+    explicit file_state(const std::string &path) {
+        struct stat st = {};
+        exists = stat(path.c_str(), &st) == 0;
+        inode = st.st_ino;
+        size = st.st_size;
+        changed = {st.st_ctim.tv_sec, st.st_ctim.tv_nsec};
+    }
+    bool operator==(const file_state &) const = default;
+
+    bool exists;
+    ino_t inode;
+    off_t size;
+    std::pair<time_t, long> changed;
+};
+
+/* What no compilation writes. */
+void write_output(const std::string &path) {
+    std::ofstream(path) << "what was there before";
 }
 
 void look_through(const std::string &output) {
@@ -115,17 +150,21 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size
         return 0;
     unsigned options = data[0];
     std::string output = f.output((options & 0x10) == 0);
-    f.write_source(data + 1, size - 1);
-    if ((options & 0x20) == 0)
-        unlink(output.c_str());
-    bool existed = access(output.c_str(), F_OK) == 0;
+    std::size_t text = size - 1;
+    bool across = (options & 0x40) != 0 && text / 2 < SOURCE_BUFFER;
+    f.write_source(data + 1, text, across ? (SOURCE_BUFFER - text / 2) / files::COMMENT.size() : 0);
+    unlink(output.c_str());
+    if ((options & 0x20) != 0)
+        write_output(output);
+    file_state before(output);
     int lowest_free = probe();
     int status = compile_one(options, f.source, output);
     fuzz::require(probe() == lowest_free, "a descriptor stayed open");
     expect_no_mapping();
+    fuzz::require(status == 0 || status == 1, "another status than 0 and 1");
     if (status == 0)
         look_through(output);
     else
-        fuzz::require(existed == (access(output.c_str(), F_OK) == 0), "the output was touched");
+        fuzz::require(file_state(output) == before, "the output was touched");
     return 0;
 }

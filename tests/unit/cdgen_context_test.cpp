@@ -4,7 +4,9 @@
 
 #include <gtest/gtest.h>
 
+#include <cerrno>
 #include <cstdio>
+#include <exception>
 #include <filesystem>
 #include <fstream>
 #include <string>
@@ -61,6 +63,16 @@ TEST_F(Context, RefusedOptionIsForgotten) {
     EXPECT_EQ(cdgen_main(2, argv), 1);
     options = "-qq"; /* what a parser that remembers would go on with */
     EXPECT_EQ(run(minimal, "after.cdef"), 0);
+}
+
+/* Where there is no memory even for the exception that would say so. */
+TEST(Process, WithoutMemoryEndsWithTheSystemsStatus) {
+    auto take_and_terminate = [] {
+        take_process();
+        std::terminate();
+    };
+    EXPECT_EXIT(take_and_terminate(), testing::ExitedWithCode(ENOMEM),
+                "^cfg_malloc malloc failure: Cannot allocate memory\n$");
 }
 
 } // namespace

@@ -1,0 +1,100 @@
+"""Signals and other programs: what ends cdgen, or cuts its output, leaves no half database.
+
+Every case is a function below, named for what it shows.  strace lets a signal
+arrive at one system call on the output, so that nothing depends on time.  Where
+processes may not be traced, a case exits with 77 and says why.
+"""
+
+import os
+import shutil
+import signal
+import subprocess
+import sys
+import time
+
+from cases import BEFORE, HEAD, OUT, SOURCE, TIMEOUT, Cases, Skip, attributes, check, expect
+
+case = Cases()
+ENDING = (signal.SIGHUP, signal.SIGINT, signal.SIGQUIT, signal.SIGTERM)
+TRACE = "trace"
+STAGES = ("ftruncate", "writev", "mmap")  # emptying what was there, filling, mapping
+
+
+def struck(world, call, number, file=OUT, **more):
+    """The program, started to get a signal at a system call on a file."""
+    tracer = shutil.which("strace")
+    if tracer is None:
+        raise Skip("no strace(1) here")
+    world.write(TRACE, b"")
+    options = ["-o", world.path(TRACE), "-P", world.path(file), "-e", f"trace={call}", "-e", f"inject={call}:signal={number}:when=1"]
+    probe = subprocess.run([tracer, "-qq", "-o", "/dev/null", "true"], capture_output=True, check=False)
+    if probe.returncode != 0:
+        raise Skip("tracing is not allowed here: " + probe.stderr.decode())
+    command = [tracer, *options, world.program, world.path(SOURCE), world.path(OUT)]
+    return subprocess.Popen(command, stdout=subprocess.PIPE, stderr=subprocess.PIPE, **world.options(**more))
+
+
+def ended_by(process, number):
+    """Ended by the signal itself, in silence."""
+    streams = process.communicate(timeout=TIMEOUT)
+    check((process.returncode, *streams) == (-number, b"", b""), "expected", -number, "actual", process.returncode, streams)
+
+
+@case
+def before_the_output_is_opened(world):
+    """What was there stays."""
+    for number in ENDING:
+        world.write(OUT, BEFORE)
+        ended_by(struck(world, "read", number, SOURCE), number)
+        check(world.read() == BEFORE, "the output was touched")
+
+
+@case
+def while_the_output_is_written(world):
+    """The output goes, and the program ends as the signal wants it."""
+    for number in ENDING:
+        for stage in STAGES:
+            world.write(OUT, BEFORE)
+            ended_by(struck(world, stage, number), number)
+            check(not world.path(OUT).exists(), "an output is left at", stage)
+
+
+@case
+def ignored_ones_stay_ignored(world):
+    """As for what goes on in the background when its terminal is closed."""
+    good = world.good()
+    for number in ENDING:
+        process = struck(world, "mmap", number, preexec_fn=lambda number=number: signal.signal(number, signal.SIG_IGN))
+        check((process.wait(TIMEOUT), world.read()) == (0, good), "an ignored signal had an effect")
+
+
+def only_child(process):
+    """The process that a tracer has started."""
+    with open(f"/proc/{process.pid}/task/{process.pid}/children", encoding="ascii") as children:
+        return int(children.read().split()[0])
+
+
+def wait_until_stopped(world, process):
+    """The traced program's number, once the tracer says that it has stopped."""
+    while b"stopped by SIGSTOP" not in world.read(TRACE):
+        check(process.poll() is None, "ended before it was stopped:", process.returncode)
+        time.sleep(0.001)
+    return only_child(process)
+
+
+@case
+def output_cut_by_another_program(world):
+    """A message and a status; the file is the other program's."""
+    world.write(SOURCE, HEAD + attributes(1000))
+    process = struck(world, "mmap", signal.SIGSTOP)
+    child = wait_until_stopped(world, process)
+    world.path(OUT).write_bytes(b"other")
+    os.kill(child, signal.SIGCONT)
+    streams = process.communicate(timeout=TIMEOUT)
+    expect(subprocess.CompletedProcess([], process.returncode, *streams), 1,
+           b"Cannot map CDB file: it was cut while it was written\n")
+    check(world.path(OUT).stat().st_size < 8192, "the output was written")
+
+
+if __name__ == "__main__":
+    sys.exit(case.main(__doc__))

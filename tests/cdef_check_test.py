@@ -26,7 +26,7 @@ RAISES = re.compile(
 )
 NAMED_TEXTS = re.compile(r"\b(?:NO_CLASS|COPY_ERROR|DATA_ERROR|no_class) = (\"[^\"]+\")")
 RETURNED_TEXTS = re.compile(r"const char \*message = (.*?);", re.S)
-OTHER_LITERALS = {"", "it is the source file", " cdefsrc_filename cdef_filename"}
+OTHER_LITERALS = {"", "it is the source file", "traces go there", " cdefsrc_filename cdef_filename"}
 
 
 def read_case(path):

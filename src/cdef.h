@@ -71,6 +71,9 @@ void add_diff(CLI::App &app, int &status);
 void add_dump(CLI::App &app, int &status);
 void add_check(CLI::App &app, int &status);
 
+/* The program; returns its exit status. */
+int cdef_main(int argc, char **argv);
+
 } // namespace cdef
 
 #endif

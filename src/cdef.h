@@ -58,7 +58,8 @@ void require_readable_aloud(const input &in);
 /* Writes to standard output; throws trouble if that fails. */
 void print(const std::string &text);
 
-/* Indented, with a newline behind it. Bytes that are no UTF-8 (a file's name may have some) become U+FFFD. */
+/* Indented, ASCII only, with a newline behind it. Bytes that are no UTF-8 (a file's name may have some) become U+FFFD.
+ */
 std::string json_text(const nlohmann::ordered_json &data);
 
 /* Terminal colours: on if standard output is a terminal and NO_COLOR is not set (or empty). */

@@ -8,7 +8,8 @@ namespace cdef {
 
 std::string json_text(const nlohmann::ordered_json &data) {
     constexpr int INDENT = 2;
-    return data.dump(INDENT, ' ', false, nlohmann::ordered_json::error_handler_t::replace) + "\n";
+    constexpr bool ASCII_ONLY = true; /* whatever a terminal would act upon is escaped */
+    return data.dump(INDENT, ' ', ASCII_ONLY, nlohmann::ordered_json::error_handler_t::replace) + "\n";
 }
 
 } // namespace cdef

@@ -5,8 +5,13 @@
 #include "cdb_view.h"
 #include "read_everything.h"
 
+#include <algorithm>
+#include <array>
+#include <bit>
 #include <cstdint>
 #include <cstdlib>
+#include <fcntl.h>
+#include <span>
 #include <string>
 #include <string_view>
 #include <unistd.h>
@@ -36,6 +41,32 @@ inline void read_all(const cdb::database &db, bool sound) {
     all.read(db);
     volatile std::uint64_t sum = all.sum;
     static_cast<void>(sum);
+}
+
+inline void put(std::span<std::byte> image, std::size_t at, std::uint32_t word, std::endian order) {
+    auto raw = std::bit_cast<std::array<std::byte, 4>>(word);
+    if (order != std::endian::native)
+        std::reverse(raw.begin(), raw.end());
+    std::copy(raw.begin(), raw.end(), image.begin() + static_cast<std::ptrdiff_t>(at));
+}
+
+/* Sets length and checksum right, which chance never does; without it hardly anything would be sound. The image has a
+ * header at least. */
+inline void make_whole(std::span<std::byte> image, std::endian order) {
+    cdb::bytes all(image, order);
+    auto length = static_cast<std::uint32_t>(image.size() - 4);
+    std::uint32_t sum = length;
+    for (std::size_t word = 0; word < (length - 4) / 4; ++word)
+        sum ^= all.number<std::uint32_t>(8 + 4 * word);
+    put(image, 0, length, order);
+    put(image, 4, sum, order);
+}
+
+/* The lowest descriptor that is free. */
+inline int probe() {
+    int fd = open("/dev/null", O_RDONLY | O_CLOEXEC);
+    close(fd);
+    return fd;
 }
 
 } // namespace fuzz

@@ -23,24 +23,6 @@ public:
     std::span<std::byte> bytes;
 };
 
-void put(std::span<std::byte> image, std::size_t at, std::uint32_t word, std::endian order) {
-    auto raw = std::bit_cast<std::array<std::byte, 4>>(word);
-    if (order != std::endian::native)
-        std::reverse(raw.begin(), raw.end());
-    std::copy(raw.begin(), raw.end(), image.begin() + static_cast<std::ptrdiff_t>(at));
-}
-
-/* Sets length and checksum right, which chance never does; without it hardly anything would be sound. */
-void make_whole(std::span<std::byte> image, std::endian order) {
-    cdb::bytes all(image, order);
-    auto length = static_cast<std::uint32_t>(image.size() - 4);
-    std::uint32_t sum = length;
-    for (std::size_t word = 0; word < (length - 4) / 4; ++word)
-        sum ^= all.number<std::uint32_t>(8 + 4 * word);
-    put(image, 0, length, order);
-    put(image, 4, sum, order);
-}
-
 /* A bit of the checksum, which says nothing else, chooses. */
 bool stays_as_it_is(const orb_cdb_header_t &header) {
     return (header.cdb_hdr_checksum & 0x100) != 0;
@@ -87,7 +69,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size
         look_through(db);
         return 0;
     }
-    make_whole(image.bytes, db.order());
+    fuzz::make_whole(image.bytes, db.order());
     look_through(cdb::database(image.bytes));
     return 0;
 }

@@ -2,8 +2,9 @@
 
 DIRECTORY/source gets the golden sources and generated ones, each behind a byte
 of options; DIRECTORY/image what cdgen makes of them, in both byte orders, and
-the images of tests/image; DIRECTORY/source.dict the words of the language, as
-the compiler's own catalogue has them.
+the images of tests/image; DIRECTORY/cdef all of these, behind a byte that says
+what is done with them; DIRECTORY/source.dict the words of the language, as the
+compiler's own catalogue has them.
 """
 
 import argparse
@@ -19,6 +20,11 @@ import generate_sources  # noqa: E402
 
 GENERATED = 50
 OPTIONS = (0x00, 0x08, 0x07, 0x0E, 0x10, 0x20)  # see source_fuzz.cpp
+# See cdef_fuzz.cpp.
+DATABASE_FORMS = range(9)
+DIFF_FORMS = range(9, 12)
+CHECK_FORMS = range(12, 16)
+WHOLE = 0x10
 MORE_WORDS = (
     "0x", "-1", "0", "4294967296", "9223372036854775807", "18446744073709551616", "1e39", "1e-46", "nan", "inf", "0x1p-149",
     ",", "1,2", '""', '"', "\\\\", "\\377", "//", "/*", "#", "SBS", "UNKNOWN", "\0", "\r\n", "1.2.3.4", "SDDefinition",
@@ -42,6 +48,23 @@ def compile_source(cdgen, directory, text, name):
         environment = {**os.environ, "VX_CDB_FORCE_EMPTY_TIMESTAMP": ""}
         subprocess.run([cdgen, *option, source, out], env=environment, capture_output=True, check=False)
     source.unlink()
+
+
+def write_cdef_seeds(directory):
+    """One seed for each source and each image; and for each image its comparison with the next one."""
+    seeds = directory / "cdef"
+    for path in sorted((directory / "source").iterdir()):
+        form = CHECK_FORMS[int(path.name) % len(CHECK_FORMS)]
+        (seeds / f"source-{path.name}").write_bytes(bytes([form]) + path.read_bytes()[1:])
+    images = [path.read_bytes() for path in sorted((directory / "image").rglob("*")) if path.is_file()]
+    for number, image in enumerate(images):
+        whole = WHOLE * (number // len(DATABASE_FORMS) % 2)
+        form = DATABASE_FORMS[number % len(DATABASE_FORMS)] | whole
+        (seeds / f"image-{number}").write_bytes(bytes([form]) + image)
+        if len(image) < 1 << 16:
+            form = DIFF_FORMS[number % len(DIFF_FORMS)] | whole
+            pair = len(image).to_bytes(2, "big") + image + images[(number + 1) % len(images)]
+            (seeds / f"pair-{number}").write_bytes(bytes([form]) + pair)
 
 
 def escaped(word):
@@ -73,7 +96,7 @@ def main():
     parser.add_argument("--list-names", type=pathlib.Path, required=True)
     parser.add_argument("directory", type=pathlib.Path)
     options = parser.parse_args()
-    for name in ("source", "image"):
+    for name in ("source", "image", "cdef"):
         (options.directory / name).mkdir(parents=True, exist_ok=True)
     for number, text in enumerate(sources()):
         option = OPTIONS[number % len(OPTIONS)]
@@ -81,6 +104,7 @@ def main():
         compile_source(options.cdgen.resolve(), options.directory / "image", text, number)
     command = [sys.executable, "-B", TESTS / "image" / "make_images.py", "--out", options.directory / "image"]
     subprocess.run(command, check=True)
+    write_cdef_seeds(options.directory)
     dictionary = sorted({escaped(word) for word in words(options.list_names.resolve())})
     (options.directory / "source.dict").write_text("".join(dictionary))
 

@@ -72,13 +72,6 @@ private:
     FILE *null = nullptr;
 };
 
-/* The lowest descriptor that is free. */
-int probe() {
-    int fd = open("/dev/null", O_RDONLY | O_CLOEXEC);
-    close(fd);
-    return fd;
-}
-
 /* The status that the program ends with. */
 int compile_one(unsigned options, std::string source, std::string output) {
     std::string program = "cdgen", letters = "-d0";
@@ -157,9 +150,9 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size
     if ((options & 0x20) != 0)
         write_output(output);
     file_state before(output);
-    int lowest_free = probe();
+    int lowest_free = fuzz::probe();
     int status = compile_one(options, f.source, output);
-    fuzz::require(probe() == lowest_free, "a descriptor stayed open");
+    fuzz::require(fuzz::probe() == lowest_free, "a descriptor stayed open");
     expect_no_mapping();
     fuzz::require(status == 0 || status == 1, "another status than 0 and 1");
     if (status == 0)

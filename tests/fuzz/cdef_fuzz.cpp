@@ -1,0 +1,379 @@
+/* cdef_fuzz: gives arbitrary bytes to each of cdef's subcommands, by its command line.
+ *
+ * The first byte holds what is done: bits 0 to 3 the form, see forms; of a database, bit 4 sets length and checksum
+ * right; of a comparison, bit 5 compares the file with itself. The rest is the file; of a comparison, two bytes, the
+ * higher first, are the size of the one file, and what follows them is that file and the other. Whatever the files say,
+ * the status is one that the documents name, what is shown is text that no terminal acts upon, JSON is JSON, and what
+ * the subcommands say of the same file goes together. */
+
+#include "cdef.h"
+#include "cdgen.h"
+#include "fuzz.h"
+
+#include <nlohmann/json.hpp>
+
+#include <algorithm>
+#include <array>
+#include <cstdio>
+#include <cstdlib>
+#include <fcntl.h>
+#include <sstream>
+#include <string>
+#include <sys/mman.h>
+#include <unistd.h>
+#include <vector>
+
+namespace {
+
+using bytes = std::vector<std::byte>;
+using words = std::vector<std::string>;
+using json = nlohmann::json;
+
+/* A file in memory, by a name that can be opened. */
+class memory_file {
+public:
+    explicit memory_file(const char *name) : fd(memfd_create(name, MFD_CLOEXEC)) {
+        fuzz::require(fd >= 0, "no memory file");
+        path = "/proc/self/fd/" + std::to_string(fd);
+    }
+
+    void fill(std::span<const std::byte> with) const {
+        bool written =
+            ftruncate(fd, 0) == 0 && pwrite(fd, with.data(), with.size(), 0) == static_cast<ssize_t>(with.size());
+        fuzz::require(written, "a file cannot be filled");
+    }
+
+    std::string path;
+
+private:
+    int fd;
+};
+
+/* A standard stream that goes to memory while this lives. */
+class captured {
+public:
+    explicit captured(FILE *&standard) : stream(standard), former(standard) {
+        stream = open_memstream(&text, &size);
+        fuzz::require(stream != nullptr, "no memory stream");
+    }
+    captured(const captured &) = delete;
+    captured &operator=(const captured &) = delete;
+    ~captured() {
+        fclose(stream);
+        stream = former;
+        free(text);
+    }
+
+    std::string taken() const {
+        fuzz::require(fflush(stream) == 0, "a memory stream is full");
+        return {text, size};
+    }
+
+private:
+    FILE *&stream;
+    FILE *former;
+    char *text = nullptr;
+    std::size_t size = 0;
+};
+
+/* What a run of cdef came to. */
+struct outcome {
+    int status;
+    std::string out;
+    std::string err;
+};
+
+/* One of the two programs' drivers, with its arguments. */
+outcome run(int (*program)(int, char **), words arguments) {
+    arguments.insert(arguments.begin(), "program");
+    std::vector<char *> argv;
+    for (std::string &argument : arguments)
+        argv.push_back(argument.data());
+    argv.push_back(nullptr);
+    int lowest_free = fuzz::probe();
+    outcome came = {};
+    {
+        captured out(stdout);
+        captured err(stderr);
+        came.status = program(static_cast<int>(arguments.size()), argv.data());
+        came.out = out.taken();
+        came.err = err.taken();
+    }
+    fuzz::require(fuzz::probe() == lowest_free, "a descriptor stayed open");
+    return came;
+}
+
+outcome cdef_says(words arguments) {
+    return run(cdef::cdef_main, std::move(arguments));
+}
+
+/* ---- What is shown ----------------------------------------------------------------------------------------------- */
+
+/* A second statement of what a terminal must not get, by the bytes that stand for it; the program's own goes by
+ * characters. Line separator, marks and overrides of the writing direction, byte order mark. */
+constexpr std::array<std::string_view, 9> acted_upon = {"\xE2\x80\xA8", "\xE2\x80\x8E", "\xE2\x80\x8F",
+                                                        "\xE2\x80\xAA", "\xE2\x80\xAE", "\xE2\x81\xA6",
+                                                        "\xE2\x81\xA9", "\xEF\xBB\xBF", "\xC2\xAD"};
+
+/* A control character that UTF-8 has two bytes for. */
+bool is_long_control(std::string_view text, std::size_t at) {
+    return text[at] == '\xC2' && at + 1 < text.size() && static_cast<unsigned char>(text[at + 1]) < 0xA0;
+}
+
+bool is_utf8(const std::string &text) {
+    try {
+        return !nlohmann::json(text).dump().empty();
+    } catch (const nlohmann::json::type_error &) {
+        return false;
+    }
+}
+
+void expect_harmless(const std::string &text) {
+    for (std::size_t i = 0; i < text.size(); ++i) {
+        auto c = static_cast<unsigned char>(text[i]);
+        bool control = (c < 0x20 && c != '\n' && c != '\t') || c == 0x7F || is_long_control(text, i);
+        fuzz::require(!control, "a control character is shown");
+    }
+    for (std::string_view sequence : acted_upon)
+        fuzz::require(text.find(sequence) == std::string::npos, "a character is shown that a terminal acts upon");
+    fuzz::require(is_utf8(text), "what is shown is no UTF-8");
+}
+
+json parsed(const std::string &text) {
+    fuzz::require(text.ends_with('\n') && json::accept(text), "no JSON");
+    return json::parse(text);
+}
+
+/* ---- Databases --------------------------------------------------------------------------------------------------- */
+
+struct judgement {
+    bool found;    /* anything */
+    bool sound;    /* no errors */
+    bool readable; /* no errors but those that leave the rest readable */
+};
+
+judgement judge(const bytes &image) {
+    judgement all = {false, true, true};
+    for (const cdb::finding &f : cdb::verify(cdb::database(image))) {
+        bool error = f.broken->level == cdb::severity::error;
+        all.found = true;
+        all.sound = all.sound && !error;
+        all.readable =
+            all.readable && (!error || f.broken->code == cdb::CODE_CHECKSUM || f.broken->code == cdb::CODE_RESERVED);
+    }
+    return all;
+}
+
+/* The files of a run: fixed names, since what is found has to be found again. */
+struct files {
+    files() : directory("/dev/shm/cdef-fuzz-XXXXXX") {
+        setenv("NO_COLOR", "1", 1);
+        setenv("VX_CDB_FORCE_EMPTY_TIMESTAMP", "", 1);
+        fuzz::require(mkdtemp(directory.data()) != nullptr, "no directory");
+        output = directory + "/class.cdef"; /* as check assumes */
+    }
+    files(const files &) = delete;
+    files &operator=(const files &) = delete;
+    ~files() {
+        unlink(output.c_str());
+        rmdir(directory.c_str());
+    }
+
+    memory_file first{"first"};
+    memory_file second{"second"};
+    std::string directory;
+    std::string output;
+};
+
+files &all_files() {
+    static files f;
+    return f;
+}
+
+/* What the compiler makes of the second file: the database, at the place for it, or a message. */
+outcome compiled(const memory_file &source) {
+    return run(cdgen_main, {"-n", source.path, all_files().output});
+}
+
+void look_at_verify(const outcome &came, const bytes &image, const words &form) {
+    auto has = [&](const char *word) { return std::find(form.begin(), form.end(), word) != form.end(); };
+    judgement is = judge(image);
+    bool passes = has("--werror") ? !is.found : is.sound;
+    fuzz::require(came.status == (passes ? cdef::OK : cdef::FOUND) && came.err.empty(), "another verdict");
+    if (has("--json"))
+        fuzz::require(parsed(came.out).at(0).at("sound") == passes, "another verdict in JSON");
+    else
+        fuzz::require(came.out.empty() != (has("--quiet") ? !is.sound : is.found), "findings are not told, or none");
+}
+
+void look_at_dump(const outcome &came, const bytes &image, const words &form) {
+    bool shown = came.status == cdef::OK;
+    fuzz::require(shown == judge(image).readable && came.out.empty() != shown, "the wrong databases are shown");
+    if (!shown || std::find(form.begin(), form.end(), "--json") == form.end())
+        return;
+    fuzz::require(parsed(came.out).at("size") == image.size(), "another size in JSON");
+}
+
+/* Each line has its offset in front, then bytes. */
+void look_at_hex(const outcome &came, const bytes &image, const words & /*form*/) {
+    constexpr std::size_t BYTES_AT = 10;
+    constexpr std::size_t BYTES_A_LINE = 16;
+    fuzz::require(came.status == cdef::OK, "bytes cannot be shown");
+    bytes shown;
+    std::istringstream lines(came.out);
+    for (std::string line; std::getline(lines, line);) {
+        fuzz::require(line.size() > BYTES_AT && std::stoul(line.substr(0, 8), nullptr, 16) == shown.size(),
+                      "an offset is wrong");
+        std::string part = line.substr(BYTES_AT, 3 * BYTES_A_LINE);
+        for (std::size_t at = 0; at < part.size() && part[at] != ' '; at += 3)
+            shown.push_back(static_cast<std::byte>(std::stoul(part.substr(at, 2), nullptr, 16)));
+    }
+    fuzz::require(shown == image, "other bytes are shown than the file has");
+}
+
+/* Where the source says itself that its output needs a certain name, it is not compiled. */
+void look_at_source(const outcome &came, const bytes &image, const words & /*form*/) {
+    bool refused = came.err.find(": no source: ") != std::string::npos;
+    fuzz::require(came.status == (judge(image).readable && !refused ? cdef::OK : cdef::TROUBLE),
+                  "no source, no reason");
+    fuzz::require(came.out.empty() == (came.status != cdef::OK), "half a source");
+    if (came.status != cdef::OK || came.out.find("called after the output file") != std::string::npos)
+        return;
+    const files &f = all_files();
+    f.second.fill(std::as_bytes(std::span(came.out)));
+    fuzz::require(compiled(f.second).status == 0, "the source does not compile");
+    outcome compared = cdef_says({"diff", f.first.path, f.output});
+    if (compared.status != cdef::OK)
+        fuzz::fail("the source means something else: " + compared.out + compared.err);
+}
+
+/* ---- Two databases ----------------------------------------------------------------------------------------------- */
+
+void look_at_diff(const outcome &came, const bytes &before, const bytes &after, const words &form) {
+    bool readable = judge(before).readable && judge(after).readable;
+    bool too_often = came.err.find("lead to the same place too often") != std::string::npos;
+    fuzz::require((came.status == cdef::TROUBLE) == (!readable || too_often), "another status");
+    fuzz::require(before != after || came.status != cdef::FOUND, "a file differs from itself");
+    if (came.status == cdef::TROUBLE) {
+        fuzz::require(came.out.empty(), "half a comparison");
+        return;
+    }
+    bool as_json = std::find(form.begin(), form.end(), "--json") != form.end();
+    bool none = as_json ? parsed(came.out).empty() : came.out.empty();
+    fuzz::require(none == (came.status == cdef::OK), "differences are not told, or none");
+}
+
+/* ---- Sources ------------------------------------------------------------------------------------------------------
+ */
+
+/* As JSON tells a text: bytes that are no UTF-8 are replaced. */
+std::string told(const std::string &text) {
+    return json::parse(json(text).dump(-1, ' ', false, json::error_handler_t::replace)).get<std::string>();
+}
+
+/* The first error is the compiler's. */
+void expect_first(const json &findings, const std::string &message) {
+    auto first = std::find_if(findings.begin(), findings.end(), [](const json &f) { return f["severity"] == "error"; });
+    fuzz::require((first == findings.end()) == message.empty(), "an error is told, or none");
+    if (message.empty())
+        return;
+    std::string text = first->at("message");
+    std::string with_line = first->at("line").dump() + ": " + text;
+    if (told(message) != text && told(message) != with_line)
+        fuzz::fail("the compiler says " + message + ", check " + with_line);
+}
+
+void look_at_check(const outcome &came, const bytes & /*source*/, const words &form) {
+    auto has = [&](const char *word) { return std::find(form.begin(), form.end(), word) != form.end(); };
+    outcome compiler = compiled(all_files().first);
+    bool compiles = compiler.status == 0;
+    fuzz::require(came.status != cdef::TROUBLE, "a source cannot be checked");
+    if (has("--werror"))
+        fuzz::require(came.err.empty() == (came.status == cdef::OK), "another status");
+    else
+        fuzz::require(came.status == (compiles ? cdef::OK : cdef::FOUND), "check and compiler differ");
+    if (has("json"))
+        expect_first(parsed(came.out).at(0).at("findings"), compiler.err);
+    else if (has("sarif"))
+        fuzz::require(parsed(came.out).at("version") == "2.1.0", "no SARIF");
+    else
+        fuzz::require(came.out.empty(), "findings on standard output");
+}
+
+/* ---- The forms ----------------------------------------------------------------------------------------------------
+ */
+
+struct form {
+    words arguments;
+    void (*look)(const outcome &, const bytes &, const words &); /* null: two files */
+};
+
+const std::array<form, 16> forms = {{
+    {{"verify"}, look_at_verify},
+    {{"verify", "--json"}, look_at_verify},
+    {{"verify", "--werror", "--quiet"}, look_at_verify},
+    {{"dump"}, look_at_dump},
+    {{"dump", "--offsets"}, look_at_dump},
+    {{"dump", "--json"}, look_at_dump},
+    {{"dump", "--json", "--offsets"}, look_at_dump},
+    {{"dump", "--hex"}, look_at_hex},
+    {{"source"}, look_at_source},
+    {{"diff"}, nullptr},
+    {{"diff", "--compat"}, nullptr},
+    {{"diff", "--json"}, nullptr},
+    {{"check"}, look_at_check},
+    {{"check", "--format", "json"}, look_at_check},
+    {{"check", "--format", "sarif"}, look_at_check},
+    {{"check", "--werror"}, look_at_check},
+}};
+
+constexpr unsigned WHOLE = 0x10;
+constexpr unsigned SAME = 0x20;
+
+bytes database_of(std::span<const std::byte> data, unsigned options) {
+    bytes image(data.begin(), data.end());
+    if ((options & WHOLE) != 0 && image.size() >= sizeof(orb_cdb_header_t))
+        fuzz::make_whole(image, cdb::database(image).order());
+    return image;
+}
+
+outcome shown(words arguments, const words &paths) {
+    bool is_source = arguments.front() == "source";
+    arguments.insert(arguments.end(), paths.begin(), paths.end());
+    outcome came = cdef_says(arguments);
+    if (!is_source) /* texts stand in it as they are */
+        expect_harmless(came.out);
+    expect_harmless(came.err);
+    return came;
+}
+
+void compare(const form &with, std::span<const std::byte> data, unsigned options) {
+    if (data.size() < 2)
+        return;
+    std::size_t told_size = std::to_integer<std::size_t>(data[0]) << 8 | std::to_integer<std::size_t>(data[1]);
+    std::size_t size = std::min(told_size, data.size() - 2);
+    bytes before = database_of(data.subspan(2, size), options);
+    bytes after = (options & SAME) != 0 ? before : database_of(data.subspan(2 + size), options);
+    const files &f = all_files();
+    f.first.fill(before);
+    f.second.fill(after);
+    look_at_diff(shown(with.arguments, {f.first.path, f.second.path}), before, after, with.arguments);
+}
+
+} // namespace
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size) {
+    if (size == 0)
+        return 0;
+    const form &with = forms[data[0] & 0xF];
+    std::span<const std::byte> rest = std::as_bytes(std::span(data, size)).subspan(1);
+    if (with.look == nullptr) {
+        compare(with, rest, data[0]);
+        return 0;
+    }
+    bytes file = with.arguments.front() == "check" ? bytes(rest.begin(), rest.end()) : database_of(rest, data[0]);
+    const files &f = all_files();
+    f.first.fill(file);
+    with.look(shown(with.arguments, {f.first.path}), file, with.arguments);
+    return 0;
+}

@@ -14,10 +14,10 @@
 
 #include <algorithm>
 #include <array>
+#include <charconv>
 #include <cstdio>
 #include <cstdlib>
 #include <fcntl.h>
-#include <sstream>
 #include <string>
 #include <sys/mman.h>
 #include <unistd.h>
@@ -140,8 +140,10 @@ void expect_harmless(const std::string &text) {
 }
 
 json parsed(const std::string &text) {
-    fuzz::require(text.ends_with('\n') && json::accept(text), "no JSON");
-    return json::parse(text);
+    constexpr bool EXCEPTIONS = false;
+    json data = json::parse(text, nullptr, EXCEPTIONS);
+    fuzz::require(!data.is_discarded() && text.ends_with('\n'), "no JSON");
+    return data;
 }
 
 /* ---- Databases --------------------------------------------------------------------------------------------------- */
@@ -164,11 +166,12 @@ judgement judge(const bytes &image) {
     return all;
 }
 
-/* The files of a run: fixed names, since what is found has to be found again. */
+/* The files of a run. Standard output is no terminal then: cdef source does not write everything to one. */
 struct files {
     files() : directory("/dev/shm/cdef-fuzz-XXXXXX") {
-        setenv("NO_COLOR", "1", 1);
-        setenv("VX_CDB_FORCE_EMPTY_TIMESTAMP", "", 1);
+        int null = open("/dev/null", O_WRONLY | O_CLOEXEC);
+        fuzz::require(dup2(null, STDOUT_FILENO) == STDOUT_FILENO, "no null device");
+        close(null);
         fuzz::require(mkdtemp(directory.data()) != nullptr, "no directory");
         output = directory + "/class.cdef"; /* as check assumes */
     }
@@ -190,7 +193,7 @@ files &all_files() {
     return f;
 }
 
-/* What the compiler makes of the second file: the database, at the place for it, or a message. */
+/* What the compiler makes of a source: the database, at the place for it, or a message. */
 outcome compiled(const memory_file &source) {
     return run(cdgen_main, {"-n", source.path, all_files().output});
 }
@@ -214,19 +217,28 @@ void look_at_dump(const outcome &came, const bytes &image, const words &form) {
     fuzz::require(parsed(came.out).at("size") == image.size(), "another size in JSON");
 }
 
+std::size_t hexadecimal(std::string_view digits) {
+    std::size_t number = 0;
+    auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), number, 16);
+    fuzz::require(error == std::errc() && end == digits.data() + digits.size(), "no hexadecimal number");
+    return number;
+}
+
 /* Each line has its offset in front, then bytes. */
 void look_at_hex(const outcome &came, const bytes &image, const words & /*form*/) {
+    constexpr std::size_t OFFSET = 8;
     constexpr std::size_t BYTES_AT = 10;
     constexpr std::size_t BYTES_A_LINE = 16;
     fuzz::require(came.status == cdef::OK, "bytes cannot be shown");
     bytes shown;
-    std::istringstream lines(came.out);
-    for (std::string line; std::getline(lines, line);) {
-        fuzz::require(line.size() > BYTES_AT && std::stoul(line.substr(0, 8), nullptr, 16) == shown.size(),
+    for (std::string_view rest = came.out; !rest.empty();) {
+        std::string_view line = rest.substr(0, rest.find('\n'));
+        rest.remove_prefix(std::min(line.size() + 1, rest.size()));
+        fuzz::require(line.size() > BYTES_AT && hexadecimal(line.substr(0, OFFSET)) == shown.size(),
                       "an offset is wrong");
-        std::string part = line.substr(BYTES_AT, 3 * BYTES_A_LINE);
+        std::string_view part = line.substr(BYTES_AT, 3 * BYTES_A_LINE);
         for (std::size_t at = 0; at < part.size() && part[at] != ' '; at += 3)
-            shown.push_back(static_cast<std::byte>(std::stoul(part.substr(at, 2), nullptr, 16)));
+            shown.push_back(static_cast<std::byte>(hexadecimal(part.substr(at, 2))));
     }
     fuzz::require(shown == image, "other bytes are shown than the file has");
 }

@@ -1,9 +1,9 @@
 /* source_fuzz: compiles arbitrary bytes, and looks through what comes of them.
  *
  * The first byte holds the options: bit 0 n, bits 1 and 2 the level of d, bit 3 s, bit 4 an output whose name no class
- * can take, bit 5 an output that exists, bit 6 a source that stands across the end of the read buffer. The rest is the
- * source. Whatever it says, the compilation ends with a database or with status 1; a database is sound, and all of it
- * can be read; an error leaves the output as it was. */
+ * can take, bit 5 an output that exists, bits 6 and 7 a source that stands across the end of the read buffer. The rest
+ * is the source. Whatever it says, the compilation ends with a database or with status 1; a database is sound, and all
+ * of it can be read; an error leaves the output as it was. */
 
 #include "cdgen.h"
 #include "fuzz.h"
@@ -45,7 +45,7 @@ public:
     void write_source(const std::uint8_t *data, std::size_t size, std::size_t lines) const {
         std::string text;
         for (std::size_t i = 0; i < lines; ++i)
-            text += COMMENT;
+            text.append("#").append(COMMENT - 2, '-').append("\n");
         text.append(reinterpret_cast<const char *>(data), size);
         bool written = ftruncate(source_fd, 0) == 0 &&
                        pwrite(source_fd, text.data(), text.size(), 0) == static_cast<ssize_t>(text.size());
@@ -58,7 +58,7 @@ public:
 
     std::string source;
 
-    static constexpr std::string_view COMMENT = "#23456789012345678901234567890123456789012345678901234567890123\n";
+    static constexpr std::size_t COMMENT = 254; /* bytes of a line */
 
 private:
     static std::string make_directory() {
@@ -144,8 +144,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size
     unsigned options = data[0];
     std::string output = f.output((options & 0x10) == 0);
     std::size_t text = size - 1;
-    bool across = (options & 0x40) != 0 && text / 2 < SOURCE_BUFFER;
-    f.write_source(data + 1, text, across ? (SOURCE_BUFFER - text / 2) / files::COMMENT.size() : 0);
+    bool across = (options & 0xC0) == 0xC0 && text / 2 < SOURCE_BUFFER;
+    f.write_source(data + 1, text, across ? (SOURCE_BUFFER - text / 2) / files::COMMENT : 0);
     unlink(output.c_str());
     if ((options & 0x20) != 0)
         write_output(output);

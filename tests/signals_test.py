@@ -31,7 +31,9 @@ def struck(world, call, number, file=OUT, **more):
     if probe.returncode != 0:
         raise Skip("tracing is not allowed here: " + probe.stderr.decode())
     command = [tracer, *options, world.program, world.path(SOURCE), world.path(OUT)]
-    return subprocess.Popen(command, stdout=subprocess.PIPE, stderr=subprocess.PIPE, **world.options(**more))
+    started = world.options(**more)
+    started["env"]["ASAN_OPTIONS"] = "detect_leaks=0"  # which looks for them by tracing, too
+    return subprocess.Popen(command, stdout=subprocess.PIPE, stderr=subprocess.PIPE, **started)
 
 
 def ended_by(process, number):
@@ -65,7 +67,9 @@ def ignored_ones_stay_ignored(world):
     good = world.good()
     for number in ENDING:
         process = struck(world, "mmap", number, preexec_fn=lambda number=number: signal.signal(number, signal.SIG_IGN))
-        check((process.wait(TIMEOUT), world.read()) == (0, good), "an ignored signal had an effect")
+        streams = process.communicate(timeout=TIMEOUT)
+        expect(subprocess.CompletedProcess([], process.returncode, *streams), 0)
+        check(world.read() == good, "another database")
 
 
 def only_child(process):

@@ -70,7 +70,7 @@ struct verdict {
 
 verdict judge(const std::string &path, const verify_options &options) {
     input in(path);
-    verdict v;
+    verdict v = {.text = {}, .data = json::object()};
     v.data["file"] = path;
     v.data["sound"] = true;
     v.data["findings"] = json::array();

@@ -12,7 +12,6 @@
 #include <cstdlib>
 #include <cstring>
 #include <iostream>
-#include <new>
 #include <unistd.h>
 
 namespace cdef {

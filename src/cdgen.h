@@ -32,9 +32,9 @@ struct tbl_content {
         return static_cast<size_t>(tbl_next - tbl_base);
     }
 
-    char *tbl_base;       /* null until the first reservation */
-    char *tbl_next;       /* first unreserved byte */
-    const char *tbl_name; /* for traces and messages */
+    char *tbl_base = nullptr;       /* null until the first reservation */
+    char *tbl_next = nullptr;       /* first unreserved byte */
+    const char *tbl_name = nullptr; /* for traces and messages */
 };
 
 /* An append-only arena of zero-filled bytes. Grows by whole allocation units, and so does tbl_size, which the traces

@@ -66,7 +66,7 @@ extent::claim_result extent::claim(std::size_t at, std::size_t length) {
     return claim_result::FIRST;
 }
 
-/* Whether one of eight bytes is zero: only for it does taking 1 away carry into a highest bit that was not set. */
+/* Whether one of eight bytes is zero: where none is, taking 1 from each sets no highest bit that was not set. */
 static bool has_zero(const std::byte *unit) {
     constexpr std::uint64_t ONES = 0x0101010101010101;
     std::uint64_t word = 0;

@@ -1,7 +1,7 @@
 /* inner_bench.cpp: what the compiler's inner functions cost, one by one. Of use while one of them is being changed;
  * whether the whole got faster, only script/bench tells. */
 
-#include "cdgen.h"
+#include "compiler/cdgen.h"
 
 #include <benchmark/benchmark.h>
 

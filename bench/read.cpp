@@ -1,7 +1,7 @@
 /* read.cpp: reads all of a database through its views; of the database that comes with the benchmark it is known that
  * it is sound. */
 
-#include "read_everything.h"
+#include "reader/read_everything.h"
 
 #include <cstdio>
 

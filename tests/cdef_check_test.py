@@ -15,7 +15,7 @@ import shlex
 import subprocess
 import sys
 
-TABLE = "src/cdef_check_messages.cpp"
+TABLE = "src/check/messages.cpp"
 ERROR_ROW = re.compile(r'\{"(S\d{3})",\s*"((?:[^"\\]|\\.)+)", \w+, blame::\w+\}')
 WARNING_ROW = re.compile(r'\{[A-Z_]+, "(S\d{3})", "([a-z-]+)",\s*"((?:[^"\\]|\\.)+)"\}')
 STRING = re.compile(r'"((?:[^"\\]|\\.)*)"')
@@ -65,7 +65,7 @@ def check_case(cdef, expectation):
 def raised(root):
     """Every text that the compiler's sources give to a fatal exit."""
     texts = set()
-    for path in sorted(root.glob("src/cdgen*.[ch]*")):
+    for path in sorted(root.glob("src/compiler/cdgen*.[ch]*")):
         source = path.read_text()
         calls = RAISES.findall(source) + NAMED_TEXTS.findall(source) + RETURNED_TEXTS.findall(source)
         calls += re.findall(r'\.no_class = ("[^"]+")', source)

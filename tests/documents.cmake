@@ -1,7 +1,7 @@
 # What the documents, the manual pages and the editor files say is what the programs do.
 
 add_executable(list_names tools/list_names.cpp)
-target_link_libraries(list_names PRIVATE cdgen_core)
+target_link_libraries(list_names PRIVATE cdgen_compiler)
 
 add_test(NAME document/names COMMAND Python3::Interpreter -B "${CMAKE_CURRENT_SOURCE_DIR}/names_test.py"
   $<TARGET_FILE:list_names>)

@@ -6,8 +6,8 @@
  * the status is one that the documents name, what is shown is text that no terminal acts upon, JSON is JSON, and what
  * the subcommands say of the same file goes together. */
 
-#include "cdef.h"
-#include "cdgen.h"
+#include "cdef/cdef.h"
+#include "compiler/cdgen.h"
 #include "fuzz.h"
 
 #include <nlohmann/json.hpp>

@@ -3,7 +3,7 @@
 #define CDGEN_FUZZ_H
 
 #include "cdb_view.h"
-#include "read_everything.h"
+#include "reader/read_everything.h"
 
 #include <algorithm>
 #include <array>

@@ -5,7 +5,7 @@
  * is the source. Whatever it says, the compilation ends with a database or with status 1; a database is sound, and all
  * of it can be read; an error leaves the output as it was. */
 
-#include "cdgen.h"
+#include "compiler/cdgen.h"
 #include "fuzz.h"
 
 #include <array>

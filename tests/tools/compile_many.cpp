@@ -5,7 +5,7 @@
  * If the process ends before its input does, the first line without an answer is the one that ended it.
  */
 
-#include "cdgen.h"
+#include "compiler/cdgen.h"
 
 #include <algorithm>
 #include <cstdio>

@@ -13,7 +13,7 @@
  */
 
 #include "cdb_fields.h"
-#include "cdgen.h"
+#include "compiler/cdgen.h"
 
 #include <cstdio>
 

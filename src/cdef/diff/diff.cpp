@@ -1,0 +1,124 @@
+/* diff.cpp: what differs between two databases, and whether readers of the one can read the other. */
+
+#include "cdef/cdef.h"
+#include "compare/compare.h"
+
+#include <CLI/CLI.hpp>
+#include <nlohmann/json.hpp>
+
+#include <memory>
+
+namespace cdef {
+
+namespace {
+
+using json = nlohmann::ordered_json;
+
+struct diff_options {
+    std::string before;
+    std::string after;
+    bool compat = false; /* only what breaks readers */
+    bool as_json = false;
+};
+
+const char *name_of(change what) {
+    return what == change::removed ? "removed" : what == change::added ? "added" : "changed";
+}
+
+char sign_of(change what) {
+    return what == change::removed ? '-' : what == change::added ? '+' : '~';
+}
+
+bool has_one_class(const thing &database) {
+    return std::count_if(database.parts.begin(), database.parts.end(),
+                         [](const thing &t) { return t.kind == "ResourceClass"; }) == 1;
+}
+
+/* What of a path has to be said: not that the thing is in the database, nor that it is in the only class. */
+std::vector<const thing *> told_of(const difference &d, bool one_class) {
+    std::size_t skipped = d.path.size() == 1                                                     ? 0
+                          : d.path.size() > 2 && one_class && d.path[1]->kind == "ResourceClass" ? 2
+                                                                                                 : 1;
+    return {d.path.begin() + static_cast<std::ptrdiff_t>(skipped), d.path.end()};
+}
+
+std::string line_of(const difference &d, bool one_class, bool with_reason) {
+    std::string line = {sign_of(d.what), ' '};
+    bool first = true;
+    for (const thing *t : told_of(d, one_class)) {
+        line += (std::exchange(first, false) ? "" : ", ") + t->kind + (t->name.empty() ? "" : " ") + t->name;
+    }
+    if (d.what == change::changed)
+        line += ": " + std::string(d.before->label) + " " + d.before->text + " -> " + d.after->text;
+    if (with_reason)
+        line += " (" + std::string(breach(d)) + ")";
+    return line + "\n";
+}
+
+json json_of(const difference &d) {
+    json data;
+    data["change"] = name_of(d.what);
+    data["path"] = json::array();
+    for (const thing *t : std::span(d.path).subspan(1)) { /* the first is the database */
+        json entry;
+        entry["kind"] = t->kind;
+        entry["name"] = t->name;
+        data["path"].push_back(std::move(entry));
+    }
+    if (d.what == change::changed) {
+        data["field"] = d.before->field;
+        data["before"] = d.before->text;
+        data["after"] = d.after->text;
+    }
+    if (!breach(d).empty())
+        data["breaks"] = breach(d);
+    return data;
+}
+
+thing read(const std::string &path, std::unique_ptr<input> &in) {
+    in = std::make_unique<input>(path);
+    require_readable_aloud(*in);
+    try {
+        return meaning_of(in->db);
+    } catch (const trouble &t) {
+        throw trouble(path + ": " + t.what());
+    }
+}
+
+int diff(const diff_options &options) {
+    if (options.before == "-" && options.after == "-")
+        throw trouble("only one of the two can be standard input");
+    std::unique_ptr<input> in_before, in_after;
+    thing before = read(options.before, in_before);
+    thing after = read(options.after, in_after);
+    std::vector<difference> found = differences(before, after);
+    if (options.compat)
+        std::erase_if(found, [](const difference &d) { return breach(d).empty(); });
+    bool one_class = has_one_class(before) && has_one_class(after);
+    std::string text;
+    json all = json::array();
+    for (const difference &d : found)
+        if (options.as_json)
+            all.push_back(json_of(d));
+        else
+            text += line_of(d, one_class, options.compat);
+    print(options.as_json ? json_text(all) : text);
+    return found.empty() ? OK : FOUND;
+}
+
+} // namespace
+
+void add_diff(CLI::App &app, int &status) {
+    auto options = std::make_shared<diff_options>();
+    CLI::App *command =
+        app.add_subcommand("diff", "Shows what differs between two databases; blind to how they are laid out");
+    command->add_option("A", options->before, "The one database; - is standard input")->required();
+    command->add_option("B", options->after, "The other")->required();
+    command->add_flag("--compat", options->compat, "Show only what keeps readers of A from reading B, and why");
+    command->add_flag("--json", options->as_json, "Differences as JSON");
+    command->footer("Exit status: 0 if they are the same (with --compat: if readers of A can read B), 1 if not, 2 if "
+                    "that cannot be told.");
+    command->callback([options, &status] { status = diff(*options); });
+}
+
+} // namespace cdef

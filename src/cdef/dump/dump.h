@@ -1,0 +1,194 @@
+/* dump.h: what the forms of `cdef dump` share: the facts that a database states, how they read as text, and the
+ * sink that a form is. */
+#ifndef CDGEN_CDEF_DUMP_H
+#define CDGEN_CDEF_DUMP_H
+
+#include "cdef/cdef.h"
+
+#include <array>
+#include <variant>
+
+namespace cdef::dump {
+
+/* ---- Facts ----------------------------------------------------------------------------------------------------- */
+
+struct none {};
+
+/* One of our own words: the name of a type, a version, a time. */
+struct word {
+    std::string text;
+};
+
+/* A set of words, perhaps empty. */
+struct words {
+    std::vector<std::string> list;
+};
+
+/* Text from the file: any bytes. */
+struct text {
+    std::string_view bytes;
+};
+
+struct binary {
+    std::span<const std::byte> bytes;
+};
+
+/* A number that reads best in hexadecimal. */
+struct bits {
+    std::uint32_t number;
+};
+
+/* A number that stands for something with a name; kind is empty if it stands for nothing known. */
+struct named {
+    std::uint32_t number;
+    std::string_view kind;
+    std::string_view name;
+};
+
+/* found and expected are empty if it is correct. */
+struct checksum {
+    std::string found;
+    std::string expected;
+};
+
+using fact = std::variant<none, std::int64_t, std::uint64_t, float, double, bits, word, words, text, binary,
+                          vx_resource_handle_t, named, checksum>;
+
+/* As the listing shows it, on one line and free of bytes that a terminal would act upon. */
+std::string as_text(const fact &f);
+
+/* In double quotes, with everything escaped that is not printable UTF-8. */
+std::string quoted(std::string_view bytes);
+
+/* How many bytes the UTF-8 character in front of bytes takes; 0: there is none. */
+std::size_t utf8_length(std::string_view bytes);
+
+/* The same of one that may go to a terminal as it is; 0 also if it would steer the terminal, or hide. */
+std::size_t printable_length(std::string_view bytes);
+
+/* The text with the same things escaped as in quotes, but for quotes and backslashes: for messages. */
+std::string harmless(std::string_view bytes);
+
+/* Pairs of hexadecimal digits. */
+std::string hex_of(std::span<const std::byte> bytes);
+
+/* The shortest text that reads back the same: "0.1", "-0", "1e+300", "-inf", "nan", and "nan(0x1)" for one that is not
+ * the usual one. */
+std::string shortest(float number);
+std::string shortest(double number);
+
+/* ---- Fields ---------------------------------------------------------------------------------------------------- */
+
+/* What a record's field stands for, if a plain number or reference does not say it all. */
+enum class meaning : std::uint8_t {
+    PLAIN,
+    SIGNED,
+    BITS,
+    MARK, /* four characters */
+    TIME,
+    CHECKSUM,
+    SECTION_TYPE,
+    CLASS_PROPERTIES,
+    PERSISTENT_PROPERTIES,
+    DYNAMIC_PROPERTIES,
+    ACTION_PROPERTIES,
+    PERMISSIONS,
+    DATA_TYPE,
+    VARIABLE_TYPE,
+    VERSION,
+    NONE_IS_0,
+    NONE_IS_255,
+    NONE_IS_65535,
+    LOCATOR, /* of an attribute; 65535: none */
+    MANAGER,
+    OFFSET, /* says where something stands, and nothing else */
+    UNUSED  /* a reference that is 0 in every file */
+};
+
+struct record_format {
+    std::string_view record;
+    std::span<const cdb::field> fields;
+    std::size_t size;            /* bytes; of a list and a class hash, without the entries */
+    std::string_view name_field; /* leads to the record's name; empty: it has none */
+};
+
+/* All records that a file may hold. */
+extern const std::span<const record_format> record_formats;
+
+/* Of an unknown record: without fields. */
+const record_format &format_of(std::string_view record);
+
+/* The field of that name, or null. */
+const cdb::field *find_field(const record_format &format, std::string_view name);
+
+meaning meaning_of(std::string_view record, const cdb::field &f);
+
+/* The number in a field of an area. */
+std::uint32_t number_in(const cdb::bytes &area, std::size_t at, const cdb::field &f);
+
+/* What it means as far as it can be told from the number alone. */
+fact fact_of(meaning as, std::uint32_t number);
+
+/* The data type that a record names for its values; VX_UNKNOWN if it names none. */
+vx_data_type_t data_type_in(const record_format &format, const cdb::bytes &area, std::size_t at);
+
+/* A value that stands in its cell, or is none. */
+fact fact_of(const cdb::value &value);
+
+/* The tables that a section's references lead into. */
+cdb::class_tables tables_of(const cdb::database &db, std::size_t section);
+
+/* Of the list table that a reference leads into; not for other targets. */
+const cdb::bytes &lists_of(const cdb::class_tables &tables, cdb::target to);
+
+/* ---- Forms ----------------------------------------------------------------------------------------------------- */
+
+/* Text on its way to standard output, so that no listing has to be in memory as a whole. */
+class output {
+public:
+    std::string text;
+
+    void flush_if_full() {
+        if (text.size() >= FULL)
+            flush();
+    }
+    void flush() {
+        print(text);
+        text.clear();
+    }
+
+private:
+    static constexpr std::size_t FULL = 65536;
+};
+
+/* How a fact or a group of them is called. */
+struct label {
+    std::string_view key; /* in JSON; of no account in a list */
+    std::string title;    /* in the listing; empty: not shown there */
+};
+
+/* Takes the facts of a database in their order. Groups nest; a list's members are facts or groups without keys. */
+class sink {
+public:
+    sink() = default;
+    sink(const sink &) = delete;
+    sink &operator=(const sink &) = delete;
+    virtual ~sink() = default;
+
+    virtual void open(const label &group) = 0;
+    virtual void open_list(const label &list) = 0;
+    virtual void close() = 0;
+    virtual void add(const label &what, const fact &f) = 0;
+};
+
+/* Each shows a whole database on standard output; throws trouble if that fails. */
+void show_listing(const input &in, bool with_offsets);
+void show_json(const input &in, bool with_offsets);
+void show_hex(const input &in);
+
+/* Tells a sink all facts of a readable database. */
+void walk(const cdb::database &db, sink &to, bool with_offsets);
+
+} // namespace cdef::dump
+
+#endif

@@ -1,0 +1,22 @@
+/* main.cpp: the program's entry; everything else is a library that a fuzzer links too. */
+
+#include "cdef/cdef.h"
+
+#include <cstdio>
+#include <cstdlib>
+#include <new>
+
+namespace {
+
+/* No exception: JSON values are destroyed on its way, and that takes memory too. */
+[[noreturn]] void end_without_memory() {
+    std::fputs("cdef: out of memory\n", stderr);
+    std::exit(cdef::TROUBLE);
+}
+
+} // namespace
+
+int main(int argc, char **argv) {
+    std::set_new_handler(end_without_memory);
+    return cdef::cdef_main(argc, argv);
+}

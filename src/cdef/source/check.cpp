@@ -1,0 +1,145 @@
+/* check.cpp: what no source can say: fields that no line sets, sections that are not made. */
+
+#include "cdef/cdef.h"
+#include "cdef/source/source.h"
+#include "compare/compare.h"
+
+namespace cdef {
+
+namespace {
+
+/* What the stanzas say of a record; and what hangs on their number and order. */
+constexpr std::string_view written[] = {
+    "rc_props",           "u_rc_name",         "u_rc_def_input",      "u_rc_undef_input",  "u_rc_online_input",
+    "u_rc_offline_input", "u_rc_reset_input",  "rc_perm_temp",        "rc_perm_tempC",     "rc_dscr_msgid",
+    "rc_disp_msgid",      "rc_locator",        "rc_version",          "ra_props",          "u_ra_name",
+    "ra_dscr_msgid",      "ra_disp_msgid",     "ra_group_msgid",      "ra_group_id",       "ra_attr_id",
+    "ra_data_type",       "u_ra_variety_list", "u_ra_valid_vals",     "u_ra_sd",           "ra_max_sd_idx",
+    "u_ra_express",       "u_ra_rearm_expr",   "ra_var_type",         "ra_expr_desc",      "ra_rearm_desc",
+    "ac_action_id",       "ac_props",          "ac_dscr_msgid",       "ac_disp_msgid",     "ac_confirm_msgid",
+    "ac_timeout",         "ac_perms",          "u_ac_name",           "u_ac_variety_list", "u_ac_sd_input",
+    "u_ac_sd_resp",       "u_sd_field_name",   "sd_field_type",       "sd_disp_msgid",     "sd_dscr_msgid",
+    "u_sd_valid_vals",    "u_rm_RMname",       "u_rcm_msg_file",      "rcm_dscr_msg_set",  "rcm_first_key",
+    "rcm_last_key",       "rvc_obsv_interval", "rvc_report_interval", "u_rvc_name",        "u_rvc_compat_name",
+};
+
+/* Fields that the compiler gives another value than 0, always the same. */
+struct constant {
+    std::string_view field;
+    std::uint32_t value;
+};
+constexpr constant constants[] = {{"sd_action_id", 65535}, {"sd_valid_type", 1}, {"u_rc_alias", CDB_NONE}};
+
+std::uint32_t constant_of(std::string_view field) {
+    for (const constant &c : constants)
+        if (c.field == field)
+            return c.value;
+    return 0;
+}
+
+std::uint32_t number_at(const std::byte *from, std::size_t width) {
+    std::uint16_t half = 0;
+    std::uint32_t whole = 0;
+    std::memcpy(&half, from, sizeof half);
+    if (width != sizeof half)
+        std::memcpy(&whole, from, sizeof whole);
+    return width == sizeof half ? half : whole;
+}
+
+/* Every field that nothing writes has the one value that the compiler gives it. */
+template <class Record> void require_plain(const Record &record, const std::string &place) {
+    const auto *bytes = reinterpret_cast<const std::byte *>(&record);
+    for (const cdb::field &f : cdb::fields_of<Record>) {
+        if (f.kind != cdb::field_kind::number && f.kind != cdb::field_kind::reference)
+            continue;
+        if (is_layout(f.name) || std::find(std::begin(written), std::end(written), f.name) != std::end(written))
+            continue;
+        std::uint32_t found = number_at(bytes + f.offset, f.width);
+        if (found != constant_of(f.name))
+            no_source(place, "no line sets " + std::string(f.name) + " to " + std::to_string(found));
+    }
+}
+
+void require_plain_definition(const cdb::sd_definition &definition, const std::string &place) {
+    for (const cdb::sd_element &e : definition)
+        require_plain(e.record(), place + ", element " + in_quotes(e.name()));
+}
+
+template <class List> void require_plain_attributes(const List &list, std::string_view kind) {
+    for (const auto &attr : list) {
+        std::string place = place_of(kind, attr.name());
+        require_plain(attr.record(), place);
+        require_plain_definition(attr.structure(), place);
+    }
+}
+
+void require_plain_actions(const cdb::resource_class &c, cdb::level level, std::string_view kind) {
+    for (const cdb::action &action : c.actions(level)) {
+        std::string place = place_of(kind, action.name());
+        require_plain(action.record(), place);
+        require_plain_definition(action.input(), place);
+        require_plain_definition(action.response(), place);
+    }
+}
+
+void require_plain_class(const cdb::resource_class &c) {
+    using enum cdb::level;
+    std::string place = place_of("ResourceClass", c.name());
+    require_plain(c.record(), place);
+    for (const class_input &input : class_inputs)
+        require_plain_definition(c.sd_input(input.reference), place);
+    require_plain_attributes(c.persistent_attributes(of_resource), "PersistentResourceAttribute");
+    require_plain_attributes(c.persistent_attributes(of_class), "PersistentClassAttribute");
+    require_plain_attributes(c.dynamic_attributes(of_resource), "DynamicResourceAttribute");
+    require_plain_attributes(c.dynamic_attributes(of_class), "DynamicClassAttribute");
+    require_plain_actions(c, of_resource, "ResourceAction");
+    require_plain_actions(c, of_class, "ClassAction");
+}
+
+bool is_made(cdb_dsect_type_t type) {
+    return type >= CDB_DSECT_RSRC_MGR && type <= CDB_DSECT_CMMAP;
+}
+
+void require_sections(const cdb::database &db) {
+    std::array<std::size_t, CDB_DSECT_CMMAP + 1> counts = {};
+    for (std::size_t i = 0; i < db.section_count(); ++i) {
+        cdb_dsect_anchor_t anchor = db.anchor(i);
+        if (!is_made(anchor.cda_type))
+            no_source("section " + std::to_string(i), "no source makes one of type " + std::to_string(anchor.cda_type));
+        if (anchor.cda_revision != 0)
+            no_source("section " + std::to_string(i), "no source gives it a revision");
+        ++counts[anchor.cda_type];
+    }
+    if (counts[CDB_DSECT_CLASS] == 0)
+        no_source("database", "it has no class");
+    if (counts[CDB_DSECT_RSRC_MGR] != 1)
+        no_source("database", "a source has one manager, this has " + std::to_string(counts[CDB_DSECT_RSRC_MGR]));
+    if (counts[CDB_DSECT_CMMAP] != 1)
+        no_source("database",
+                  "a source has one ClassToManagerMapping, this has " + std::to_string(counts[CDB_DSECT_CMMAP]));
+}
+
+} // namespace
+
+void no_source(const std::string &what, const std::string &why) {
+    throw trouble("no source: " + what + ": " + why);
+}
+
+std::string place_of(std::string_view kind, std::string_view name) {
+    return std::string(kind) + " " + in_quotes(name.substr(0, 100));
+}
+
+void require_settable(const cdb::database &db) {
+    require_plain(db.header(), "database");
+    require_sections(db);
+    for (const cdb::resource_class &c : db.classes())
+        require_plain_class(c);
+    for (const cdb::manager &m : db.managers())
+        require_plain(m.record(), place_of("ResourceManager", m.name()));
+    for (const cdb::class_map &m : db.maps())
+        require_plain(m.record(), "ClassToManagerMapping");
+    for (const cdb::variable_class &v : db.variable_classes())
+        require_plain(v.record(), place_of("ResourceVariableClass", v.name()));
+}
+
+} // namespace cdef

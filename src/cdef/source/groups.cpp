@@ -1,0 +1,185 @@
+/* groups.cpp: which variable class each dynamic attribute names. A database has it the other way round:
+ * variable classes list the IDs of their attributes, in the order of the attributes. As long as IDs are unique, each
+ * list says which attributes it means. Where they are not, attributes are dealt out so that every list comes about. */
+
+#include "cdef/source/source.h"
+#include "compare/compare.h"
+
+#include <unordered_map>
+#include <unordered_set>
+
+namespace cdef {
+
+namespace {
+
+/* Attributes looked at, the same ones again after each wrong choice. Careless sources need few choices. */
+constexpr std::size_t LOOKS_MAX = 20'000'000;
+
+/* A dynamic attribute as the lists know it. */
+struct member {
+    var_id_t id;
+    std::size_t of_class;
+    cdb::level level;
+    std::size_t index;
+};
+
+/* A variable class's IDs, and how many of them have been dealt with. */
+struct id_list {
+    std::string name;
+    std::vector<var_id_t> ids;
+    std::size_t done = 0;
+
+    bool is_done() const {
+        return done == ids.size();
+    }
+};
+
+/* Only an attribute that has all its required lines can name a variable class. */
+void add_members(std::vector<member> &to, const class_plan &plan, std::size_t of_class, cdb::level level) {
+    var_id_t mark = level == cdb::level::of_class ? VAR_ID_CLASS_ATTR : 0;
+    std::size_t index = 0;
+    for (const cdb::dynamic_attribute &attr : plan.view.dynamic_attributes(level)) {
+        if (is_complete(attr))
+            to.push_back({static_cast<var_id_t>(attr.id()) | mark, of_class, level, index});
+        ++index;
+    }
+}
+
+/* In the order in which the compiler lists them. */
+std::vector<member> members_of(const std::vector<class_plan> &classes) {
+    std::vector<member> members;
+    for (std::size_t c = 0; c < classes.size(); ++c) {
+        add_members(members, classes[c], c, cdb::level::of_class);
+        add_members(members, classes[c], c, cdb::level::of_resource);
+    }
+    return members;
+}
+
+/* Of variable classes with one name the first gets all IDs. */
+std::vector<id_list> lists_of(const cdb::database &db) {
+    std::vector<id_list> lists;
+    std::unordered_set<std::string> names;
+    for (const cdb::variable_class &v : db.variable_classes()) {
+        bool first = names.emplace(v.name()).second;
+        id_list list = {std::string(v.name()), {}, 0};
+        for (const cdb::variable_id &id : v.variable_ids())
+            list.ids.push_back(id.number);
+        if (!list.ids.empty() && (!first || list.name.empty()))
+            no_source(place_of("ResourceVariableClass", v.name()), "no attribute can name it, but it lists some");
+        if (!list.ids.empty())
+            lists.push_back(std::move(list));
+    }
+    return lists;
+}
+
+/* Deals members out to lists. A member goes to the one list that waits for its ID; only where several do is there a
+ * choice, which may turn out wrong later. */
+class dealer {
+public:
+    dealer(const std::vector<member> &to_deal, std::vector<id_list> &to) : members(to_deal), lists(to) {
+        owners.resize(members.size(), NOBODY);
+        for (std::size_t i = 0; i < lists.size(); ++i)
+            waiting[lists[i].ids[0]].push_back(i);
+    }
+
+    /* False if no way was found. */
+    bool deal() {
+        while (looks < LOOKS_MAX) {
+            deal_rest();
+            if (std::all_of(lists.begin(), lists.end(), [](const id_list &l) { return l.is_done(); }))
+                return true;
+            if (!choose_otherwise())
+                return false;
+        }
+        return false;
+    }
+
+    /* The list of a member, or null. */
+    const id_list *owner(std::size_t member_index) const {
+        return owners[member_index] == NOBODY ? nullptr : &lists[owners[member_index]];
+    }
+
+private:
+    static constexpr std::size_t NOBODY = SIZE_MAX;
+
+    struct choice {
+        std::size_t member;
+        std::vector<std::size_t> candidates; /* lists; the last one is chosen */
+    };
+
+    void deal_rest() {
+        for (; next < members.size(); ++next, ++looks) {
+            const std::vector<std::size_t> &candidates = waiting[members[next].id];
+            if (candidates.empty())
+                continue;
+            if (candidates.size() > 1)
+                choices.push_back({next, {candidates.rbegin(), candidates.rend()}});
+            give(next, candidates.front());
+        }
+    }
+
+    /* Goes back to the latest choice that has another candidate. */
+    bool choose_otherwise() {
+        while (!choices.empty()) {
+            choice &latest = choices.back();
+            while (next > latest.member)
+                take_back(--next);
+            latest.candidates.pop_back();
+            if (!latest.candidates.empty()) {
+                give(next++, latest.candidates.back());
+                return true;
+            }
+            choices.pop_back();
+        }
+        return false;
+    }
+
+    void give(std::size_t m, std::size_t list) {
+        stop_waiting(list);
+        ++lists[list].done;
+        wait(list);
+        owners[m] = list;
+    }
+
+    void take_back(std::size_t m) {
+        if (owners[m] == NOBODY)
+            return;
+        stop_waiting(owners[m]);
+        --lists[owners[m]].done;
+        wait(owners[m]);
+        owners[m] = NOBODY;
+    }
+
+    void wait(std::size_t list) {
+        if (!lists[list].is_done())
+            waiting[lists[list].ids[lists[list].done]].push_back(list);
+    }
+
+    void stop_waiting(std::size_t list) {
+        if (!lists[list].is_done())
+            std::erase(waiting[lists[list].ids[lists[list].done]], list);
+    }
+
+    const std::vector<member> &members;
+    std::vector<id_list> &lists;
+    std::vector<std::size_t> owners;                                /* by member */
+    std::unordered_map<var_id_t, std::vector<std::size_t>> waiting; /* lists by the ID that they wait for */
+    std::vector<choice> choices;
+    std::size_t looks = 0;
+    std::size_t next = 0; /* member */
+};
+
+} // namespace
+
+void plan_variable_classes(std::vector<class_plan> &classes, const cdb::database &db) {
+    std::vector<member> members = members_of(classes);
+    std::vector<id_list> lists = lists_of(db);
+    dealer dealing(members, lists);
+    if (!dealing.deal())
+        no_source("variable classes", "their lists of IDs do not follow from the dynamic attributes");
+    for (std::size_t i = 0; i < members.size(); ++i)
+        if (const id_list *list = dealing.owner(i))
+            classes[members[i].of_class].of(members[i].level)[members[i].index].variable_class = list->name;
+}
+
+} // namespace cdef

@@ -1,0 +1,227 @@
+/* text.cpp: lines and values, written so that the compiler reads back what they were written for. */
+
+#include "cdef/cdef.h"
+#include "cdef/source/source.h"
+#include "compare/compare.h"
+
+#include <cmath>
+
+namespace cdef {
+
+namespace {
+
+constexpr std::size_t LINE_MAX_CHARS = 254;
+constexpr std::string_view BLANKS = " \t";
+
+/* Whether the compiler takes the whole line as text: no newline, no comment, nothing at the end that it removes. */
+bool is_all_text(std::string_view line) {
+    bool quoted = false;
+    for (std::size_t i = 0; i < line.size(); ++i) {
+        char next = i + 1 < line.size() ? line[i + 1] : '\0';
+        if (line[i] == '\n' || line[i] == '\0')
+            return false;
+        if (line[i] == '"')
+            quoted = !quoted;
+        else if (!quoted && (line[i] == '#' || (line[i] == '/' && (next == '/' || next == '*'))))
+            return false;
+    }
+    return !line.ends_with(' ') && !line.ends_with('\t') && !line.ends_with('#');
+}
+
+bool begins_with_quote(std::string_view text) {
+    std::size_t first = text.find_first_not_of(BLANKS);
+    return first != std::string_view::npos && text[first] == '"';
+}
+
+bool fits(std::string_view line) {
+    return line.size() <= LINE_MAX_CHARS && is_all_text(line);
+}
+
+/* ---- Values ---------------------------------------------------------------------------------------------------- */
+
+/* Decimal, but where that would count as an underflow, which the compiler remembers and holds against later zeros. */
+template <class Float> std::string text_of_real(Float number) {
+    if (std::fpclassify(number) != FP_SUBNORMAL)
+        return text_of(number);
+    std::string text;
+    appendf(text, "%a", static_cast<double>(number));
+    return text;
+}
+
+std::string hex_of(std::span<const std::byte> data) {
+    std::string text = "0x";
+    for (std::byte b : data)
+        appendf(text, "%02x", std::to_integer<unsigned>(b));
+    return text;
+}
+
+/* A list of one text. */
+std::vector<std::string> only(std::string text) {
+    std::vector<std::string> texts;
+    texts.push_back(std::move(text));
+    return texts;
+}
+
+/* How much of a binary's text stands for itself. */
+enum class plain : std::uint8_t { printable, all };
+
+std::string escaped(std::byte b, plain which, bool in_pair) {
+    auto c = static_cast<char>(b);
+    bool safe = c > ' ' && c <= '~' && std::string_view("\"#/").find(c) == std::string_view::npos;
+    bool usable = c != '\0' && c != '\n' && c != '\\' && (c != ',' || !in_pair);
+    if (usable && (safe || which == plain::all))
+        return {c};
+    std::string text;
+    appendf(text, "\\%03o", std::to_integer<unsigned>(b));
+    return text;
+}
+
+/* The form with escapes is shorter, but its first four bytes are lost, and as many zeros follow at the end. */
+std::string text_with_escapes(std::span<const std::byte> data, plain which, bool in_pair) {
+    constexpr std::size_t LOST = 4;
+    std::string text(LOST, '.');
+    for (std::byte b : data.first(data.size() - LOST))
+        text += escaped(b, which, in_pair);
+    return text;
+}
+
+bool ends_in_zeros(std::span<const std::byte> data) {
+    return data.size() >= 4 && std::all_of(data.end() - 4, data.end(), [](std::byte b) { return b == std::byte{0}; });
+}
+
+std::vector<std::string> texts_of_binary(std::span<const std::byte> data, bool in_pair) {
+    if (data.size() >= LINE_MAX_CHARS)
+        return {};
+    std::vector<std::string> texts = only(hex_of(data));
+    if (ends_in_zeros(data))
+        for (plain which : {plain::printable, plain::all})
+            texts.push_back(text_with_escapes(data, which, in_pair));
+    return texts;
+}
+
+/* A double that is a signalling NaN has no text. */
+std::vector<std::string> texts_of_double(double number) {
+    constexpr std::uint64_t QUIET = std::uint64_t{1} << 51;
+    if (std::isnan(number) && (std::bit_cast<std::uint64_t>(number) & QUIET) == 0)
+        return {};
+    return only(text_of_real(number));
+}
+
+bool has_no_bytes(const cdb::value &v) {
+    return v.type() == VX_CHAR_PTR ? v.text().empty() : v.binary().empty();
+}
+
+bool is_empty_handle(const cdb::value &v) {
+    vx_resource_handle_t h = v.handle();
+    return (h.header | h.id.id1 | h.id.id2 | h.id.id3 | h.id.id4) == 0;
+}
+
+} // namespace
+
+std::optional<std::string> attribute_line(std::string_view name, std::string_view value) {
+    std::string start = "\t" + std::string(name) + "=";
+    std::string plain = start + std::string(value);
+    if (!value.empty() && !begins_with_quote(value) && fits(plain))
+        return plain;
+    std::string quoted = start + '"' + std::string(value) + '"';
+    if (!value.empty() && !value.ends_with('\\') && fits(quoted))
+        return quoted;
+    return std::nullopt;
+}
+
+std::vector<std::string> texts_of(const cdb::value &value, bool in_pair) {
+    if (!value.present())
+        return {};
+    switch (value.type()) {
+    case VX_INT32:
+    case VX_INT64:
+        return only(std::to_string(value.integer()));
+    case VX_UINT32:
+    case VX_UINT64:
+        return only(std::to_string(value.natural()));
+    case VX_FLOAT32:
+        return only(text_of_real(static_cast<float>(value.real())));
+    case VX_FLOAT64:
+        return texts_of_double(value.real());
+    case VX_CHAR_PTR:
+        if (in_pair && value.text().find(',') != std::string_view::npos)
+            return {};
+        return only(std::string(value.text().substr(0, LINE_MAX_CHARS)));
+    case VX_BINARY_PTR:
+        return texts_of_binary(value.binary(), in_pair);
+    default:
+        return {};
+    }
+}
+
+bool is_default(const cdb::value &value) {
+    switch (value.type()) {
+    case VX_UNKNOWN:
+    case VX_NONE:
+    case VX_SBS_PTR:
+        return true;
+    case VX_INT32:
+    case VX_INT64:
+        return value.integer() == 0;
+    case VX_UINT32:
+    case VX_UINT64:
+        return value.natural() == 0;
+    case VX_FLOAT32:
+    case VX_FLOAT64:
+        return value.real() == 0 && !std::signbit(value.real());
+    case VX_CHAR_PTR:
+    case VX_BINARY_PTR:
+        return value.present() && has_no_bytes(value);
+    case VX_RSRC_HANDLE_PTR:
+        return value.present() && is_empty_handle(value);
+    case VX_SD_PTR:
+        return false;
+    default: /* arrays */
+        return value.elements().size() == 1 && is_default(value.elements()[0]);
+    }
+}
+
+/* ---- The writer ------------------------------------------------------------------------------------------------ */
+
+void source_writer::comment(std::string_view lines) {
+    for (std::size_t end = 0; end != std::string_view::npos;) {
+        end = lines.find('\n');
+        text += "# " + std::string(lines.substr(0, end)) + "\n";
+        lines.remove_prefix(end == std::string_view::npos ? lines.size() : end + 1);
+    }
+}
+
+void source_writer::blank_line() {
+    text += "\n";
+}
+
+void source_writer::stanza(std::string_view kind, std::string place) {
+    text += std::string(kind) + "\n";
+    current = std::move(place);
+}
+
+void source_writer::line(std::string_view name, std::string_view value) {
+    line_of_any(name, only(std::string(value)));
+}
+
+void source_writer::line(std::string_view name, std::int64_t number) {
+    line(name, std::to_string(number));
+}
+
+void source_writer::optional_line(std::string_view name, std::int64_t number, std::int64_t without) {
+    if (number != without)
+        line(name, number);
+}
+
+void source_writer::line_of_any(std::string_view name, const std::vector<std::string> &values) {
+    for (const std::string &value : values) {
+        if (std::optional<std::string> written = attribute_line(name, value)) {
+            text += *written + "\n";
+            return;
+        }
+    }
+    no_source(current, "no line can give its " + std::string(name) + " (" +
+                           (values.empty() ? "a value without a text" : in_quotes(values.front())) + ")");
+}
+
+} // namespace cdef

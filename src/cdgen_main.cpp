@@ -1,8 +1,0 @@
-/* cdgen_main.cpp: the program's entry; everything else is a library that tests link too. */
-
-#include "cdgen.h"
-
-int main(int argc, char **argv) {
-    take_process();
-    return cdgen_main(argc, argv);
-}

@@ -1,0 +1,155 @@
+/* check.h: what the files of "cdef check" share. It drives the compiler's own modules over a source, line by line,
+ * and catches what would end the compilation; no other part of cdef knows the compiler. */
+#ifndef CDGEN_CDEF_CHECK_H
+#define CDGEN_CDEF_CHECK_H
+
+#include "compiler/cdgen_read.h"
+
+#include <array>
+#include <span>
+#include <stdexcept>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace cdef::check {
+
+/* ---- Messages (messages.cpp) ----------------------------------------------------------------------- */
+
+/* What of a line is marked. */
+enum class mark_kind { none, text, name, value, item /* the part of the value that the message names */ };
+
+/* Whose fault it is. */
+enum class blame { source, program, surroundings };
+
+/* An error of the compiler: what its text begins with, or what follows the item that it begins with. */
+struct message {
+    const char *code; /* for ever */
+    const char *text;
+    mark_kind mark;
+    blame whose;
+};
+
+extern const std::span<const message> messages;
+
+/* The message that a compilation ended with. */
+const message &message_of(const fatal_exit &failure);
+
+enum warning_id {
+    SD_RUN_AT_END,
+    SD_WITHOUT_RUN,
+    RANGE_ELSEWHERE,
+    UNKNOWN_LOCATOR,
+    UNKNOWN_VARIABLE_CLASS,
+    SAME_NAME,
+    SAME_ID,
+    NARROWED,
+    OCTAL,
+    NUMBER_TEXT,
+    UNUSED_DEFAULT,
+    PERMISSION,
+    ELEMENT_TYPE,
+    CUT_SHORT,
+    INCOMPLETE,
+    LONG_LINE,
+    CARRIAGE_RETURN,
+    STRAY_RUN,
+    LOW_ABOVE_HIGH,
+    TEXT_AFTER_QUOTE,
+    WARNING_COUNT
+};
+
+struct warning {
+    warning_id id;
+    const char *code; /* for ever, as is */
+    const char *name; /* which switches it */
+    const char *title;
+};
+
+extern const std::array<warning, WARNING_COUNT> warnings;
+
+using warning_set = std::array<bool, WARNING_COUNT>;
+
+/* ---- Findings ------------------------------------------------------------------------------------------------- */
+
+/* Where: a line as the compiler counts it, 0 for none, and bytes of it, column 0 for the whole line. */
+struct place {
+    int line = 0;
+    size_t column = 0; /* from 1 */
+    size_t length = 0;
+};
+
+struct note {
+    place at;
+    std::string text;
+    std::string source = {}; /* the line, if it is to be shown: the finding itself has no place in it */
+};
+
+struct finding {
+    bool error = true;
+    const char *code = "";
+    const char *name = "error"; /* a warning's */
+    std::string text;
+    place at;
+    std::string source; /* the line */
+    std::vector<note> notes;
+};
+
+struct result {
+    std::string file;
+    std::vector<finding> findings; /* by line, its errors first, in the order in which they were met */
+    size_t errors = 0;
+    size_t warnings = 0;
+};
+
+/* Checks one source; "-" is standard input. Throws cdef::trouble when it cannot be read, or when memory runs out. */
+result check_source(const std::string &path, const warning_set &wanted);
+
+/* ---- Names (names.cpp) ----------------------------------------------------------------------------- */
+
+using name_list = std::vector<std::string_view>;
+
+/* The only one of the names that the text may have been meant to be; empty if there is none or there are several. */
+std::string_view near_miss(std::string_view text, const name_list &names);
+
+/* "did you mean `Name`?", or else "known are `Name` and `Id`", unless they are too many. */
+std::string suggestion(std::string_view text, const name_list &names);
+
+name_list stanza_names();
+name_list attribute_names(const srtable_ctrl &kind);
+
+/* The stanza kinds that have an attribute of this name, as bits. */
+vx_uint32_t kinds_with(std::string_view name);
+
+/* The data types that an attribute, or an element, can be of. */
+name_list data_type_names(bool element);
+
+/* As suggestion() says it; but what is near a type that is refused is told so. */
+std::string type_suggestion(std::string_view text, bool element);
+
+name_list variable_type_names();
+name_list property_names(int attr_type);
+
+/* The required attributes of a kind that a mask lacks. */
+name_list missing_names(const srtable_ctrl &kind, vx_uint32_t mask);
+
+/* "`Name`" */
+std::string quoted(std::string_view text);
+
+/* "`Name`, `Id` and `DataType`" */
+std::string listed(const name_list &names);
+
+/* ---- Forms (report/text.cpp, report/json.cpp) -------------------------------------------------------------
+ */
+
+/* Nothing of a source, or of its name, may command a terminal: a '?' stands for each character that might. */
+std::string visible(std::string_view text);
+
+/* As compilers write it: a line for each finding and note, and the line of the source with a mark. */
+std::string as_text(const result &checked);
+std::string as_json(std::span<const result> checked);
+std::string as_sarif(std::span<const result> checked);
+
+} // namespace cdef::check
+
+#endif

@@ -1,0 +1,64 @@
+/* lines.cpp: texts, and the lines that gave them first. */
+
+#include "check/session.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace cdef::check {
+
+size_t first_lines::slot_of(std::string_view text, unsigned tag) const {
+    size_t mask = slots.size() - 1;
+    size_t at = tag & mask;
+    for (; slots[at].position != 0; at = (at + 1) & mask)
+        if (slots[at].tag == tag && text_of(slots[at].position) == text)
+            break;
+    return at;
+}
+
+void first_lines::grow() {
+    constexpr size_t FEWEST = 64;
+    std::vector<slot> old(std::max(FEWEST, 2 * slots.size()), slot{0, 0});
+    std::swap(old, slots);
+    size_t mask = slots.size() - 1;
+    for (const slot &each : old) {
+        size_t at = each.tag & mask;
+        while (each.position != 0 && slots[at].position != 0)
+            at = (at + 1) & mask;
+        if (each.position != 0)
+            slots[at] = each;
+    }
+}
+
+int &first_lines::of(std::string_view text, unsigned tag) {
+    if (2 * entries.size() >= slots.size())
+        grow();
+    slot &found = slots[slot_of(text, tag)];
+    if (found.position == 0) {
+        entries.push_back({texts.size(), 0});
+        texts += text;
+        found = {tag, static_cast<unsigned>(entries.size())};
+    }
+    return entries[found.position - 1].line;
+}
+
+bool first_lines::has(std::string_view text) const {
+    return !slots.empty() && slots[slot_of(text, tag_of(text))].position != 0;
+}
+
+name_list first_lines::all() const {
+    name_list names;
+    for (size_t position = 1; position <= entries.size(); ++position)
+        names.push_back(text_of(position));
+    return names;
+}
+
+void first_lines::clear() {
+    if (entries.empty())
+        return;
+    texts.clear();
+    entries.clear();
+    std::fill(slots.begin(), slots.end(), slot{0, 0});
+}
+
+} // namespace cdef::check

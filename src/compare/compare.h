@@ -1,0 +1,114 @@
+/* compare.h: what a database means, as a tree that can be compared: nothing of where things stand in the file, of its
+ * byte order, or of when it was made. */
+#ifndef CDGEN_CDEF_DIFF_H
+#define CDGEN_CDEF_DIFF_H
+
+#include "cdb_view.h"
+
+#include <array>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace cdef {
+
+/* One thing that is known of a record. */
+struct fact {
+    std::string_view field; /* of the record, as in cdb.h */
+    std::string_view label; /* in words */
+    std::string text;       /* printable */
+};
+
+/* A record, or an entry of a list, and what belongs to it. */
+struct thing {
+    std::string kind; /* "PersistentResourceAttribute", "valid value" */
+    std::string name; /* printable, a text in quotes; may be empty */
+    std::vector<fact> facts;
+    std::vector<thing> parts;
+};
+
+/* In single quotes; what is not printable ASCII is written as \xNN. */
+std::string in_quotes(std::string_view text);
+
+/* The shortest text that tells the number from all others; a NaN's payload is part of it: nan(0x1). */
+std::string text_of(float number);
+std::string text_of(double number);
+
+/* A field that says where things stand in the file, how many or how long they are, and none of their contents; or when
+ * the file was made. */
+bool is_layout(std::string_view field);
+
+/* The tables of a class that have a stanza for each record; those of attributes first. */
+enum class table : std::uint8_t {
+    persistent_class_attributes,
+    dynamic_class_attributes,
+    persistent_attributes,
+    dynamic_attributes,
+    class_actions,
+    actions,
+    inputs /* no table: the class record's five inputs */
+};
+constexpr std::size_t ATTRIBUTE_TABLES = 4;
+constexpr std::size_t RECORD_TABLES = 6;
+
+constexpr cdb::level level_of(table t) {
+    return t == table::persistent_class_attributes || t == table::dynamic_class_attributes || t == table::class_actions
+               ? cdb::level::of_class
+               : cdb::level::of_resource;
+}
+
+/* The attributes that a following class cut short are the last of their tables. One without valid values refers to the
+ * first list of them all the same, as if it were its own. By table, whether that is so. */
+std::array<bool, ATTRIBUTE_TABLES> without_valid_values(const cdb::resource_class &c, bool is_last_class);
+
+/* Throws trouble for a database whose values lead into each other so much that they cannot be told. */
+thing meaning_of(const cdb::database &db);
+
+/* The offset of an out-of-line value at which no such value stands: of a Range that landed in the attribute of another
+ * type. Nothing if a value does, or if the cell leads nowhere. */
+std::optional<std::uint32_t> misplaced(const cdb::value &value, const cdb::bytes &strings);
+
+/* The same of a dynamic attribute's bound, or of an element of one; wherever it leads if the type has no bounds. */
+enum class place_in : std::uint8_t { bound, array };
+std::optional<std::uint32_t> misplaced_bound(const cdb::value &value, const cdb::bytes &strings, place_in where);
+
+/* Writes values as a person reads them: 5, 0.1, 'text', 0x0102, [1, 2], {Int32 0}, nothing, misplaced 5.
+ *
+ * In a database that was compiled each value and each text has one owner, so all of them together are no larger than
+ * the file. One made by hand may lead to the same ones again and again; a limit keeps that from filling the memory. */
+class teller {
+public:
+    explicit teller(std::size_t file_size);
+
+    /* strings: of the value's class. */
+    std::string text_of(const cdb::value &value, const cdb::bytes &strings);
+    std::string text_of(std::string_view text);
+    std::string text_of_bound(const cdb::value &value, const cdb::bytes &strings, place_in where = place_in::bound);
+
+private:
+    void spend(std::size_t amount);
+    std::string text_of_elements(const cdb::value &value, const cdb::bytes &strings);
+
+    std::size_t left;
+};
+
+/* How a change shows: what is gone, what is new, what is otherwise. */
+enum class change : std::uint8_t { removed, added, changed };
+
+struct difference {
+    change what;
+    std::vector<const thing *> path; /* from the outermost thing to the one that it is about */
+    const fact *before = nullptr;    /* changed only */
+    const fact *after = nullptr;     /* changed only */
+};
+
+/* In the order of the first one; what is new in a thing after what was there before. */
+std::vector<difference> differences(const thing &before, const thing &after);
+
+/* Why a difference keeps readers of the older database from reading the newer one; empty if it does not. */
+std::string_view breach(const difference &d);
+
+} // namespace cdef
+
+#endif

@@ -1,0 +1,94 @@
+/* cdgen_attr.cpp: one attribute line: its syntax, the order and repetition rules. */
+
+#include "compiler/cdgen_attr.h"
+
+#include <cstdio>
+
+namespace {
+
+constexpr size_t VALUE_MAX_CHARS = LOCATOR_SIZE - 1;
+
+/* The name and value of a line, each ended by a NUL; no value when there is nothing to store. */
+struct name_value {
+    std::string_view name;
+    char *value;
+    size_t length;
+};
+
+name_value split_line(cdgen &cx, const attr_text &text) {
+    char *name = text.name;
+    char *end = text.end;
+    cx.linepos = 1 + static_cast<int>(name - text.line);
+    if (name == end)
+        return {};
+    auto *equals = static_cast<char *>(memchr(name, '=', static_cast<size_t>(end - name)));
+    if (equals == nullptr)
+        source_error(cx, "Missing '=' after attribute name");
+    *equals = '\0';
+    char *value = equals + 1;
+    if (value[0] == '"' && value[1] == '"' && value[2] == '\0')
+        return {};
+    char *unquoted = strip_quotes(value, &end);
+    if (unquoted == nullptr)
+        source_error(cx, "Unmatched double quotes for attribute: ", name);
+    auto length = static_cast<size_t>(end - unquoted);
+    if (length > VALUE_MAX_CHARS)
+        source_error(cx, "Attibute value exceeds maximum length: ", name); /* deliberately spelled so */
+    cx.linepos = 1 + static_cast<int>(unquoted - text.line);
+    return {{name, static_cast<size_t>(equals - name)}, unquoted, length};
+}
+
+const table_attrs &known_attr(cdgen &cx, const srtable_ctrl &scp, std::string_view name) {
+    const table_attrs *attr = find_attr(scp, name);
+    if (attr == nullptr)
+        source_error(cx, "Attribute name not defined in table (name/table): ", name.data(), scp.sc_name);
+    return *attr;
+}
+
+/* Optional attributes follow the required ones; most may stand once. */
+void count_optional(cdgen &cx, const srtable_ctrl &scp, stanza_state &state, const table_attrs &attr) {
+    if (state.req_mask != scp.req_mask_cmplt && !state.broken)
+        source_error(cx, "Optional attribute discovered before all required attributes have been defined",
+                     attr.ta_name);
+    if ((state.opt_mask & attr.req_bit & ~OPTIONAL) != 0 && !attr.dup_allowed)
+        source_error(cx, "Already defined. Duplicated definitions not allowed for ", attr.ta_name);
+    state.opt_mask |= attr.req_bit;
+}
+
+void count_required(cdgen &cx, stanza_state &state, const table_attrs &attr) {
+    if ((state.req_mask & attr.req_bit) != 0 && !attr.dup_allowed)
+        source_error(cx, "Already defined. Duplicated definitions not allowed for ", attr.ta_name);
+    state.req_mask |= attr.req_bit;
+    if (cx.debugLevel >= 2)
+        printf("Added %x to mask, which is now %x\n", attr.req_bit, state.req_mask);
+}
+
+} // namespace
+
+void save_attr(cdgen &cx, char *il, int table_id) {
+    auto kind = static_cast<size_t>(table_id);
+    char *name = il + strspn(il, " \t");
+    save_attr_line(cx, {il, name, name + strlen(name)}, sc_tables[kind], cx.stanzas[kind]);
+}
+
+void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, stanza_state &state) {
+    auto [name, value, length] = split_line(cx, text);
+    if (value == nullptr)
+        return;
+    const table_attrs &attr = known_attr(cx, scp, name);
+    cx.latest = {&attr, value, length};
+    if (*value == '\0') {
+        if (!cx.checking)
+            printf("In file %s: ", cx.cdefsrc);
+        source_error(cx, "Missing attribute value: ", attr.ta_name);
+    }
+    if (cx.debugLevel >= 2)
+        printf("%s: found attr: \"%s\", value: \"%s\",length: %d\n", scp.sc_name, attr.ta_name, value,
+               static_cast<int>(length));
+    if ((attr.req_bit & OPTIONAL) != 0)
+        count_optional(cx, scp, state, attr);
+    else
+        count_required(cx, state, attr);
+    cx.line_texts.clear();
+    store_value({cx, scp, state, static_cast<char *>(scp.sc_cb(cx)), attr, value, length});
+}

@@ -1,0 +1,396 @@
+/* cdgen_attr_values.cpp: the value handler of each attribute type. */
+
+#include "compiler/cdgen_attr.h"
+
+#include <cerrno>
+#include <cstdio>
+#include <cstdlib>
+
+namespace {
+
+/* ---- Fields of staging records -------------------------------------------------------------------------------- */
+
+char *field_of(const attr_line &line) {
+    return line.record + line.attr.ta_offset;
+}
+
+template <class Value> Value load(const char *from) {
+    Value value;
+    memcpy(&value, from, sizeof value);
+    return value;
+}
+
+template <class Value> void store(char *to, Value value) {
+    memcpy(to, &value, sizeof value);
+}
+
+long integer(const attr_line &line, const char *text) {
+    return int_from_text(line.cx, text, nullptr, 0);
+}
+
+vx_data_type_t data_type(const attr_line &line) {
+    return load<vx_data_type_t>(line.record + line.scp.dt_offset);
+}
+
+tbl *strings_of(const attr_line &line) {
+    tbl *strings = line.scp.sc_str_tbl(line.cx);
+    if (strings == nullptr)
+        source_error(line.cx, "No tbl for strings table");
+    return strings;
+}
+
+/* ---- Plain values ---------------------------------------------------------------------------------------------- */
+
+/* Deliberately truncated to the field's width, without a range check. */
+template <class Width> void store_integer(const attr_line &line) {
+    store(field_of(line), static_cast<Width>(integer(line, line.value)));
+}
+
+void store_string(const attr_line &line) {
+    store(field_of(line), add_to_tbl(line.cx, strings_of(line), line.value, line.length + 1));
+}
+
+void store_props(const attr_line &line, const props_t *props, int count) {
+    auto bits = load<vx_uint32_t>(field_of(line));
+    set_props(line.cx, &bits, props, count, line.value);
+    store(field_of(line), bits);
+}
+
+void store_class_props(const attr_line &line) {
+    store_props(line, rc_props, rc_props_cnt);
+}
+
+void store_pattr_props(const attr_line &line) {
+    store_props(line, pa_props, pa_props_cnt);
+}
+
+void store_dattr_props(const attr_line &line) {
+    store_props(line, da_props, da_props_cnt);
+}
+
+void store_action_props(const attr_line &line) {
+    store_props(line, act_props, act_props_cnt);
+}
+
+void store_version(const attr_line &line) {
+    vx_uint32_t version = 0;
+    ver_str_convert(line.cx, line.value, &version);
+    store(field_of(line), version);
+}
+
+/* The text is deliberately not interpreted. */
+void store_perm_template(const attr_line &line) {
+    store(field_of(line), vx_uint32_t{0xEEEEEEEE});
+}
+
+/* Only the first letter counts; one that is no permission leaves the field as it is. */
+void store_permission(const attr_line &line) {
+    for (const valid_perms_t *perm = perm_list; perm < perm_list + num_perm_list; ++perm)
+        if (perm->permission == line.value[0]) {
+            store(field_of(line), perm->mask);
+            return;
+        }
+}
+
+void store_variable_type(const attr_line &line) {
+    orb_variable_type_t type = ORB_COUNTER;
+    if (strToVar(line.value, &type) != 0)
+        source_error(line.cx, "Invalid variable type");
+    store(field_of(line), type);
+}
+
+/* The name is kept for the manager's record, made at the end; the map refers to manager 0, the only one. */
+void store_manager(const attr_line &line) {
+    cdgen &cx = line.cx;
+    store(field_of(line), vx_uint16_t{0});
+    if (cx.rm_name != nullptr)
+        cdgen_error_exit(cx, "Resource manager already defined: ", cx.rm_name.get(), nullptr, 0, 1);
+    cx.rm_name.reset(strdup(line.value));
+    if (cx.rm_name == nullptr)
+        cdgen_error_exit(cx, "strdup failed: ", strerror(errno), nullptr, 0, errno);
+}
+
+void store_locator(const attr_line &line) {
+    line.cx._rc_locator.ptr = &line.cx.cb_rsrc_class.rc_locator;
+    memcpy(line.cx._rc_locator.name, line.value, line.length + 1);
+}
+
+void ignore(const attr_line &) {}
+
+/* ---- Varieties and valid values -------------------------------------------------------------------------------- */
+
+/* Splits "low,high" in place; null without a comma. */
+char *after_comma(const attr_line &line) {
+    return getNextArrVal(line.value);
+}
+
+/* The offset of a list's next entry: the first one has its room in the list's header, each other one goes to the end of
+ * the table, which is where the list ends. */
+template <class List>
+size_t next_entry(cdgen &cx, tbl *t, size_t list, vx_uint32_t List::*count, size_t first, size_t size) {
+    if (record_at<List>(cx, t, list)->*count == 0)
+        return list + first;
+    auto *entry = static_cast<char *>(alloc_tble(cx, t, size));
+    return static_cast<size_t>(entry - t->tbl_base);
+}
+
+void store_variety(const attr_line &line) {
+    char *high = after_comma(line);
+    if (high == nullptr)
+        source_error(line.cx, "Incorrect variety format");
+    tbl *varieties = line.scp.sc_vty_tbl(line.cx);
+    auto list = load<vx_uint32_t>(field_of(line));
+    size_t at = next_entry(line.cx, varieties, list, &variety_list_t::vl_count, offsetof(variety_list_t, vl_values),
+                           sizeof(vl_entry_t));
+    char *rest = nullptr;
+    auto high_val = static_cast<vx_uint32_t>(int_from_text(line.cx, high, &rest, 0));
+    if (*rest != '\0' && strchr(rest, ',') != nullptr)
+        source_error(line.cx, "Too many varieties");
+    auto low_val = static_cast<vx_uint32_t>(integer(line, line.value));
+    *record_at<vl_entry_t>(line.cx, varieties, at) = {low_val, high_val};
+    ++record_at<variety_list_t>(line.cx, varieties, list)->vl_count;
+}
+
+/* Converts a text to a value that waits in the line's pool. */
+vx_value_t converted(const attr_line &line, vx_data_type_t type, const char *text) {
+    vx_value_t value = {};
+    if (str_to_vx(line.cx, &value, type, text, line.cx.line_texts) != 0)
+        source_error(line.cx, "str_to_vx: Invalid data");
+    return value;
+}
+
+/* Serialises a value into a cell, with an array of its own if it is one. */
+void copied(const attr_line &line, vx_value_t *cell, const vx_value_t &value, vx_data_type_t type,
+            const char *failure) {
+    tbl_anchor array;
+    if (copy_this_type(line.cx, cell, &value, type, TYPE_SAME, strings_of(line), &array, 1) != 0)
+        source_error(line.cx, failure);
+}
+
+constexpr const char *COPY_ERROR = "copy_this_type error";
+constexpr const char *DATA_ERROR = "str_to_vx: Invalid data";
+
+/* With a comma, high then low; without one, one value that is written twice, low then high. */
+void store_bounds(const attr_line &line, vx_data_type_t type, vv_entry_t *entry) {
+    if (char *high = after_comma(line)) {
+        copied(line, &entry->vv_high_val, converted(line, type, high), type, COPY_ERROR);
+        copied(line, &entry->vv_low_val, converted(line, type, line.value), type, DATA_ERROR);
+    } else {
+        vx_value_t value = converted(line, type, line.value);
+        copied(line, &entry->vv_low_val, value, type, COPY_ERROR);
+        copied(line, &entry->vv_high_val, value, type, COPY_ERROR);
+    }
+}
+
+/* Adds to the list at the field's offset; entries of a list are of the owner's scalar type. */
+void add_valid_value(const attr_line &line) {
+    cdgen &cx = line.cx;
+    tbl *lists = line.scp.sc_vv_tbl(cx);
+    auto list = load<vx_uint32_t>(field_of(line));
+    size_t at =
+        next_entry(cx, lists, list, &valid_values_t::vv_count, offsetof(valid_values_t, vv_values), sizeof(vv_entry_t));
+    vv_entry_t entry = {};
+    store_bounds(line, scalar_vx(data_type(line)), &entry);
+    *record_at<vv_entry_t>(cx, lists, at) = entry;
+    cx.vvdisp = at + offsetof(vv_entry_t, vv_disp_msgid);
+    ++record_at<valid_values_t>(cx, lists, list)->vv_count;
+}
+
+void store_valid_value(const attr_line &line) {
+    vx_uint16_t &found = line.cx.*(line.scp.sc_attr->vv_found);
+    if (!found) {
+        store(field_of(line), mk_vv_sec(line.cx));
+        found = 1;
+    }
+    add_valid_value(line);
+}
+
+void store_value_display(const attr_line &line) {
+    cdgen &cx = line.cx;
+    if (!cx.vvdisp.has_value())
+        source_error(cx, "No ValidValue to attach ValueDisplayName to.");
+    *record_at<vx_uint16_t>(cx, line.scp.sc_vv_tbl(cx), *cx.vvdisp) =
+        static_cast<vx_uint16_t>(integer(line, line.value));
+}
+
+/* ---- Data types, defaults and ranges --------------------------------------------------------------------------- */
+
+bool is_sd(vx_data_type_t type) {
+    return scalar_vx(type) == VX_SD_PTR;
+}
+
+std::shared_ptr<dflt_values> new_dflt_values(cdgen &cx, const char *name) {
+    if (cx.spare_dflt == nullptr)
+        return std::make_shared<dflt_values>(name);
+    cx.spare_dflt->restart(name);
+    return std::move(cx.spare_dflt);
+}
+
+/* Collects the value; the attribute's completion makes one of all that were given. */
+void store_default(const attr_line &line) {
+    cdgen &cx = line.cx;
+    vx_data_type_t type = data_type(line);
+    if (is_sd(type))
+        source_error(cx, "Default values not expected; place default values in individual *SDDef stanzas.");
+    dflt_tbl &dflt = line.state.dflt;
+    if (dflt.tbl == nullptr)
+        dflt.tbl = new_dflt_values(cx, "DefaultValues");
+    void *slot = alloc_tble(cx, &dflt.tbl->cells, sizeof(vx_value_t));
+    vx_value_t value = {};
+    if (str_to_vx(cx, &value, type, line.value, dflt.tbl->texts) != 0)
+        source_error(cx, "str_to_vx: Invalid data");
+    memcpy(slot, &value, sizeof value);
+    ++dflt.num_elems;
+}
+
+/* An SD-typed attribute gets its value from the run of SD stanzas that follows it. */
+void expect_sd_run(const attr_line &line, vx_data_type_t type) {
+    cdgen &cx = line.cx;
+    const attr_kind &kind = *line.scp.sc_attr;
+    cx.attr_dflt_val = reinterpret_cast<vx_value_t *>(line.record + kind.value_offset);
+    cx.curr_sd_tbl = reinterpret_cast<cdb_ref_t *>(line.record + kind.sd_offset);
+    cx.max_sd_idx = reinterpret_cast<vx_uint16_t *>(line.record + kind.max_sd_idx_offset);
+    cx.sd_attr_type = kind.sd_attr_type;
+    line.state.dflt.tbl = new_dflt_values(cx, type == VX_SD_PTR ? "VX_SD_PTR" : "VX_SD_PTR_ARRAY");
+}
+
+void store_data_type(const attr_line &line) {
+    vx_data_type_t type = strToVxDt(line.value);
+    store(field_of(line), type);
+    if (type == VX_UNKNOWN)
+        source_error(line.cx, "Invalid data type");
+    if (is_sd(type))
+        expect_sd_run(line, type);
+}
+
+/* Strings, binaries, handles, structured data and their arrays have no range. */
+bool takes_range(vx_data_type_t type) {
+    vx_data_type_t scalar = scalar_vx(type);
+    return scalar < VX_CHAR_PTR || scalar > VX_SD_PTR;
+}
+
+/* Deliberate: an open resource attribute gets the range even when the line stands in a class attribute's stanza, whose
+ * type it is converted as. */
+void store_range(const attr_line &line) {
+    cdgen &cx = line.cx;
+    vx_data_type_t type = data_type(line);
+    if (!takes_range(type))
+        return;
+    cx.dattr_range_found = 1;
+    char *max = after_comma(line);
+    if (max == nullptr)
+        source_error(cx, "Range requires two values");
+    bool of_resource = cx.cb_rsrc_dattr.ra_cb_ID != 0;
+    rsrc_dattr_t &target = of_resource ? cx.cb_rsrc_dattr : cx.cb_rsrc_dattrC;
+    if (of_resource)
+        cx.dattr_range_type = type;
+    copied(line, &target.ra_max_value, converted(line, type, max), type, COPY_ERROR);
+    copied(line, &target.ra_min_value, converted(line, type, line.value), type, DATA_ERROR);
+}
+
+/* ---- Elements of structured data ------------------------------------------------------------------------------- */
+
+void store_sd_name(const attr_line &line) {
+    cdb_ref_t name = {{add_to_tbl(line.cx, strings_of(line), line.value, line.length + 1), 0}};
+    store(field_of(line), name);
+    line.cx.sd_name_found = 1;
+}
+
+void store_sd_description(const attr_line &line) {
+    store_integer<vx_uint16_t>(line);
+    line.cx.sd_desc_found = 1;
+}
+
+void store_sd_display(const attr_line &line) {
+    store_integer<vx_uint16_t>(line);
+    line.cx.sd_disp_found = 1;
+}
+
+/* Text that is no number leaves the latest index, which then is not the expected one. */
+void check_sd_index(const attr_line &line) {
+    cdgen &cx = line.cx;
+    vx_value_t index = {};
+    if (str_to_vx(cx, &index, VX_UINT32, line.value, cx.line_texts) == 0)
+        cx.curr_sdeli = static_cast<int>(index.val_uint32);
+    if (cx.curr_sdeli != cx.expected_sdeli) {
+        if (!cx.checking)
+            printf("curr_sdel = %d, expected_sdeli = %d\n", cx.curr_sdeli, cx.expected_sdeli);
+        source_error(cx, "ElementIndeces must be consecutive");
+    }
+    cx.expected_sdeli = static_cast<int>(static_cast<unsigned>(cx.curr_sdeli) + 1);
+}
+
+/* An unknown type is deliberately no error here. */
+void store_sd_data_type(const attr_line &line) {
+    cdgen &cx = line.cx;
+    vx_data_type_t type = strToVxDt(line.value);
+    if (is_sd(type))
+        source_error(cx, "SD elements cannot be of SD type");
+    store(field_of(line), type);
+    cx.sd_dt_found = 1;
+    if (cx.attr_dflt_val == nullptr)
+        return;
+    dflt_tbl &dflt = line.state.dflt;
+    *static_cast<vx_value_t *>(alloc_tble(cx, &dflt.tbl->cells, sizeof(vx_value_t))) = {
+        .val_uint32 = static_cast<vx_uint32_t>(type)};
+    ++dflt.num_elems;
+    ++cx.sd_num_elems;
+}
+
+void store_sd_valid_value(const attr_line &line) {
+    if (!line.cx.sd_vv_found) {
+        store(field_of(line), cdb_ref_t{{mk_vv_sec(line.cx), 0}});
+        line.cx.sd_vv_found = 1;
+    }
+    add_valid_value(line);
+}
+
+void refuse_sd_default(const attr_line &line) {
+    source_error(line.cx, "Sorry, default SD values are not yet supported");
+}
+
+using handler = void (*)(const attr_line &);
+
+/* By attr_type. */
+constexpr std::array<handler, AT_COUNT> handlers = {
+    store_integer<uint8_t>,     /* AT_UINT8 */
+    store_integer<vx_uint16_t>, /* AT_UINT16 */
+    store_integer<vx_uint32_t>, /* AT_UINT32 */
+    store_string,               /* AT_STRING */
+    store_class_props,          /* AT_CLASS_PROPS */
+    store_version,              /* AT_VERSION */
+    store_perm_template,        /* AT_PERM_TEMPLATE */
+    store_manager,              /* AT_MANAGER */
+    store_locator,              /* AT_LOCATOR */
+    store_integer<vx_uint32_t>, /* AT_ID */
+    store_variety,              /* AT_VARIETY */
+    store_pattr_props,          /* AT_PATTR_PROPS */
+    store_dattr_props,          /* AT_DATTR_PROPS */
+    store_action_props,         /* AT_ACTION_PROPS */
+    store_valid_value,          /* AT_VALID_VALUE */
+    store_default,              /* AT_DEFAULT_VALUE */
+    store_value_display,        /* AT_VALUE_DISPLAY */
+    store_data_type,            /* AT_DATA_TYPE */
+    store_variable_type,        /* AT_VARIABLE_TYPE */
+    store_range,                /* AT_RANGE */
+    store_default,              /* AT_INITIAL_VALUE */
+    check_sd_index,             /* AT_SD_INDEX */
+    store_sd_name,              /* AT_SD_NAME */
+    store_sd_description,       /* AT_SD_DESCRIPTION */
+    store_sd_display,           /* AT_SD_DISPLAY */
+    store_sd_data_type,         /* AT_SD_DATA_TYPE */
+    store_sd_valid_value,       /* AT_SD_VALID_VALUE */
+    store_value_display,        /* AT_SD_VALUE_DISPLAY */
+    refuse_sd_default,          /* AT_SD_DEFAULT_VALUE */
+    ignore,                     /* AT_LIST_ACTION_CLASS */
+    ignore,                     /* AT_LIST_ACTION_RSRC */
+    store_permission,           /* AT_PERMISSION */
+};
+
+} // namespace
+
+void store_value(const attr_line &line) {
+    if (line.attr.ta_type < 0 || line.attr.ta_type >= AT_COUNT)
+        source_error(line.cx, "Unknown attribute");
+    handlers[static_cast<size_t>(line.attr.ta_type)](line);
+}

@@ -1,0 +1,442 @@
+/* cdgen_bld.cpp: sizes, creates, maps and fills the output file. The image is written once, by a cursor that only moves
+ * forward. Records go in and out of it by copying, since sections are not aligned. */
+
+#include "compiler/cdgen.h"
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <cstdlib>
+#include <fcntl.h>
+#include <limits>
+#include <sys/mman.h>
+#include <sys/stat.h>
+#include <sys/time.h>
+#include <sys/uio.h>
+#include <unistd.h>
+#include <utility>
+
+namespace {
+
+constexpr size_t PREFILL_BLOCK = 1024;
+
+size_t used_bytes(const cdb_ref_t &table) {
+    const tbl_content *t = staged_content(table);
+    return t == nullptr || t->tbl_base == nullptr ? 0 : t->used();
+}
+
+/* ---- Sizes ----------------------------------------------------------------------------------------------------- */
+
+/* Offsets and sizes in the file have 32 bits. */
+vx_uint32_t checked_size(cdgen &cx, size_t bytes) {
+    if (bytes > std::numeric_limits<vx_uint32_t>::max())
+        bld_error_exit(cx, "A table or section is too large for the database (4294967295 bytes at most)", nullptr,
+                       nullptr, 1);
+    return static_cast<vx_uint32_t>(bytes);
+}
+
+/* Counts have 16. */
+vx_uint16_t checked_count(cdgen &cx, const cdb_ref_t &table, size_t record) {
+    size_t count = used_bytes(table) / record;
+    if (count > std::numeric_limits<vx_uint16_t>::max())
+        bld_error_exit(cx, "Too many records of one kind in a class (65535 at most): ", staged_content(table)->tbl_name,
+                       nullptr, 1);
+    return static_cast<vx_uint16_t>(count);
+}
+
+size_t strings_size(cdgen &cx, const cdb_ref_t &strings) {
+    return round8(checked_size(cx, used_bytes(strings)));
+}
+
+/* Errors, dependencies and structured byte strings are deliberately not counted. */
+size_t class_size(cdgen &cx, rsrc_class_t &rc) {
+    rc.rc_num_pattrsC = checked_count(cx, rc.u_rc_pattrsC, sizeof(rsrc_pattr_t));
+    rc.rc_num_pattrs = checked_count(cx, rc.u_rc_pattrs, sizeof(rsrc_pattr_t));
+    rc.rc_num_dattrsC = checked_count(cx, rc.u_rc_dattrsC, sizeof(rsrc_dattr_t));
+    rc.rc_num_dattrs = checked_count(cx, rc.u_rc_dattrs, sizeof(rsrc_dattr_t));
+    rc.rc_sd_size = checked_size(cx, used_bytes(rc.u_rc_sd_defs));
+    rc.rc_num_actionsC = checked_count(cx, rc.u_rc_actionsC, sizeof(rsrc_action_t));
+    rc.rc_num_actions = checked_count(cx, rc.u_rc_actions, sizeof(rsrc_action_t));
+    rc.rc_varlist_size = checked_size(cx, used_bytes(rc.u_rc_variety_lists));
+    rc.rc_valval_size = checked_size(cx, used_bytes(rc.u_rc_valid_vals));
+    return sizeof rc + sizeof(rsrc_pattr_t) * (size_t{rc.rc_num_pattrs} + rc.rc_num_pattrsC) +
+           sizeof(rsrc_dattr_t) * (size_t{rc.rc_num_dattrs} + rc.rc_num_dattrsC) + rc.rc_sd_size +
+           sizeof(rsrc_action_t) * (size_t{rc.rc_num_actionsC} + rc.rc_num_actions) + rc.rc_varlist_size +
+           rc.rc_valval_size + strings_size(cx, rc.u_rc_strings);
+}
+
+/* ---- The output file ------------------------------------------------------------------------------------------- */
+
+[[noreturn]] void cannot(cdgen &cx, const char *what, int error) {
+    bld_error_exit(cx, what, strerror(error), nullptr, 1);
+}
+
+/* A descriptor that is closed unless it is handed on. */
+struct output_fd {
+    explicit output_fd(int opened) : fd(opened) {}
+    output_fd(const output_fd &) = delete;
+    output_fd &operator=(const output_fd &) = delete;
+    ~output_fd() {
+        if (fd >= 0)
+            close(fd);
+    }
+    int release() {
+        return std::exchange(fd, -1);
+    }
+
+    int fd;
+};
+
+bool is_stream(const struct stat &file, int stream) {
+    struct stat st = {};
+    return S_ISREG(file.st_mode) && fstat(stream, &st) == 0 && st.st_dev == file.st_dev && st.st_ino == file.st_ino;
+}
+
+/* Asked before it is opened: a source that has been deleted in the meantime may have left its inode number to the new
+ * file. */
+void refuse_own_files(cdgen &cx) {
+    struct stat st = {};
+    if (stat(cx.cdefname, &st) != 0)
+        return;
+    if (st.st_dev == cx.cdb_fp.device && st.st_ino == cx.cdb_fp.inode)
+        bld_error_exit(cx, "Cannot create CDB file: ", "it is the source file", nullptr, 1);
+    if (cx.debugLevel > 0 && (is_stream(st, STDOUT_FILENO) || is_stream(st, STDERR_FILENO)))
+        bld_error_exit(cx, "Cannot create CDB file: ", "traces go there", nullptr, 1);
+}
+
+/* Emptied only once it is known not to be a file that the program uses. */
+int create_output(cdgen &cx) {
+    refuse_own_files(cx);
+    struct stat st = {};
+    output_fd out(above_stdio(open(cx.cdefname, O_RDWR | O_CREAT | O_CLOEXEC, 0644)));
+    if (out.fd < 0)
+        cannot(cx, "Cannot create CDB file: ", errno);
+    if (fstat(out.fd, &st) != 0)
+        cannot(cx, "Cannot map CDB file: ", errno);
+    if (S_ISREG(st.st_mode))
+        set_unfinished_output(cx.cdefname);
+    if (S_ISREG(st.st_mode) && st.st_size > 0 && ftruncate(out.fd, 0) != 0)
+        cannot(cx, "Cannot create CDB file: ", errno);
+    return out.release();
+}
+
+/* Writes 1024-byte zero blocks until there are at least size bytes, many of them at a time. */
+size_t prefill(cdgen &cx, int fd, size_t size) {
+    constexpr size_t BLOCKS_AT_ONCE = 512;
+    static std::array<char, PREFILL_BLOCK> zeros;
+    std::array<iovec, BLOCKS_AT_ONCE> blocks;
+    size_t gross = (size + PREFILL_BLOCK - 1) / PREFILL_BLOCK * PREFILL_BLOCK;
+    std::fill_n(blocks.begin(), std::min(blocks.size(), gross / PREFILL_BLOCK), iovec{zeros.data(), zeros.size()});
+    for (size_t written = 0; written < gross;) {
+        size_t left = gross - written;
+        blocks[0].iov_len = (left - 1) % PREFILL_BLOCK + 1; /* what a short write has left of its block */
+        size_t count = std::min(blocks.size(), (left - 1) / PREFILL_BLOCK + 1);
+        ssize_t n = writev(fd, blocks.data(), static_cast<int>(count));
+        if (n < 0 && errno == EINTR)
+            continue;
+        if (n <= 0)
+            cannot(cx, "Cannot create CDB file: ", n < 0 ? errno : ENOSPC);
+        written += static_cast<size_t>(n);
+    }
+    return gross;
+}
+
+/* What is no regular file has no size and so cannot be mapped; a pipe, which might block, is not even written to. */
+char *get_mapfile(cdgen &cx, size_t size) {
+    output_fd out(create_output(cx));
+    struct stat st = {};
+    if (fstat(out.fd, &st) == 0 && !S_ISFIFO(st.st_mode))
+        cx.gross_file_size = prefill(cx, out.fd, size);
+    if (fstat(out.fd, &st) != 0)
+        cannot(cx, "Cannot map CDB file: ", errno);
+    size_t length = S_ISREG(st.st_mode) ? static_cast<size_t>(st.st_size) : 0;
+    void *mapped = mmap(nullptr, length, PROT_READ | PROT_WRITE, MAP_SHARED, out.fd, 0);
+    if (mapped == MAP_FAILED)
+        cannot(cx, "Cannot map CDB file: ", errno);
+    cx.cdb_mapfile_fd = out.release();
+    cx.cdb_mapfile_ptr = mapped;
+    return static_cast<char *>(mapped);
+}
+
+template <class Record> Record load(const char *from) {
+    Record record;
+    memcpy(&record, from, sizeof record);
+    return record;
+}
+
+template <class Record> void store(char *to, const Record &record) {
+    memcpy(to, &record, sizeof record);
+}
+
+void flush_mapfile(cdgen &cx) {
+    auto final_size = static_cast<off_t>(load<orb_cdb_header_t>(cx.chp).cdb_hdr_length) + 4;
+    if (cx.swap_endianness)
+        cdgen_cdef_swap(cx.chp, cx.nowhere);
+    munmap(std::exchange(cx.cdb_mapfile_ptr, nullptr), cx.gross_file_size);
+    int fd = std::exchange(cx.cdb_mapfile_fd, 0);
+    [[maybe_unused]] int truncated = ftruncate(fd, final_size);
+    set_unfinished_output(nullptr);
+    close(fd);
+}
+
+/* ---- Sections -------------------------------------------------------------------------------------------------- */
+
+/* One section in the making: what has been written of it. */
+class section {
+public:
+    section(cdgen &context, cdb_dsect_type_t type) : cx(context), anchor{type, offset_in_file(), 0, 0} {}
+
+    char *write(const void *bytes, size_t size) {
+        char *at = cx.dsp;
+        reserve(size);
+        if (size > 0)
+            memcpy(at, bytes, size);
+        return at;
+    }
+
+    /* A staged table's bytes. */
+    void write_table(const cdb_ref_t &table) {
+        if (size_t size = used_bytes(table))
+            write(staged_content(table)->tbl_base, size);
+    }
+
+    /* The same, zero-filled to a multiple of 8; returns its rounded size. */
+    vx_uint32_t write_rounded(const tbl_content *t) {
+        size_t size = t == nullptr || t->tbl_base == nullptr ? 0 : t->used();
+        write(size > 0 ? t->tbl_base : nullptr, size);
+        constexpr char zeros[8] = {};
+        write(zeros, round8(size) - size);
+        return static_cast<vx_uint32_t>(round8(size));
+    }
+
+    void finish() {
+        store(cx.dsect_anchs + sizeof anchor * static_cast<size_t>(cx.dsect_idx), anchor);
+        ++cx.dsect_idx;
+    }
+
+private:
+    vx_uint32_t offset_in_file() const {
+        return static_cast<vx_uint32_t>(cx.dsp - cx.chp);
+    }
+
+    /* The image has been sized before; only tables that no stanza fills are not counted. */
+    void reserve(size_t size) {
+        if (size > static_cast<size_t>(cx.chp + cx.gross_file_size - cx.dsp))
+            bld_error_exit(cx, "Image larger than computed - internal error", nullptr, nullptr, 1);
+        cx.dsp += size;
+        anchor.cda_length += static_cast<vx_uint32_t>(size);
+    }
+
+    cdgen &cx;
+    cdb_dsect_anchor_t anchor;
+};
+
+/* How a class's side table goes into the file, in this order. */
+struct class_side_table {
+    cdb_ref_t rsrc_class_t::*field;
+    enum { LOCATED, UNLOCATED, ROUNDED } form; /* with its offset; deliberately without; with, rounded up to 8 */
+};
+
+constexpr class_side_table class_side_tables[] = {
+    {&rsrc_class_t::u_rc_pattrsC, class_side_table::LOCATED},
+    {&rsrc_class_t::u_rc_dattrsC, class_side_table::LOCATED},
+    {&rsrc_class_t::u_rc_pattrs, class_side_table::LOCATED},
+    {&rsrc_class_t::u_rc_dattrs, class_side_table::LOCATED},
+    {&rsrc_class_t::u_rc_actionsC, class_side_table::LOCATED},
+    {&rsrc_class_t::u_rc_actions, class_side_table::LOCATED},
+    {&rsrc_class_t::u_rc_errors, class_side_table::UNLOCATED},
+    {&rsrc_class_t::u_rc_depends, class_side_table::UNLOCATED},
+    {&rsrc_class_t::u_rc_variety_lists, class_side_table::LOCATED},
+    {&rsrc_class_t::u_rc_sbs_defs, class_side_table::UNLOCATED},
+    {&rsrc_class_t::u_rc_sd_defs, class_side_table::LOCATED},
+    {&rsrc_class_t::u_rc_valid_vals, class_side_table::LOCATED},
+    {&rsrc_class_t::u_rc_strings, class_side_table::ROUNDED},
+};
+
+/* The places of references that are none, once the class's tables have theirs. Classes are the first sections. */
+void note_nowhere(cdgen &cx, const rsrc_class_t &record, const char *at) {
+    for (; cx.strays_done < cx.strays.size(); ++cx.strays_done) {
+        const stray_reference &stray = cx.strays[cx.strays_done];
+        if (stray.rsrc_class != cx.dsect_idx)
+            break;
+        cx.nowhere.push_back(static_cast<size_t>(at - cx.chp) + (record.*stray.records).offset[0] + stray.offset);
+    }
+}
+
+void add_class(cdgen &cx, const rsrc_class_t &staged) {
+    section out(cx, CDB_DSECT_CLASS);
+    char *at = out.write(&staged, sizeof staged);
+    rsrc_class_t record = staged;
+    for (auto [field, form] : class_side_tables) {
+        auto offset = static_cast<vx_uint32_t>(cx.dsp - at);
+        record.*field = {{form == class_side_table::UNLOCATED ? 0 : offset, 0}};
+        if (form == class_side_table::ROUNDED)
+            out.write_rounded(staged_content(staged.*field));
+        else
+            out.write_table(staged.*field);
+    }
+    store(at, record);
+    note_nowhere(cx, record, at);
+    out.finish();
+}
+
+/* The name is the first string of the table that follows, so that its reference is 0, as is the table's own. */
+void add_mgr(cdgen &cx, const rsrc_mgr_t &staged) {
+    section out(cx, CDB_DSECT_RSRC_MGR);
+    rsrc_mgr_t record = staged;
+    record.u_rm_RMname = {};
+    record.u_rm_strings_table = {};
+    out.write(&record, sizeof record);
+    out.write_rounded(staged_content(staged.u_rm_strings_table));
+    out.finish();
+}
+
+void add_cmmap(cdgen &cx, const rsrc_cmmap_t &staged) {
+    section out(cx, CDB_DSECT_CMMAP);
+    rsrc_cmmap_t record = staged;
+    record.u_rcm_strings = {{sizeof record, 0}};
+    out.write(&record, sizeof record);
+    out.write_rounded(staged_content(staged.u_rcm_strings));
+    out.finish();
+}
+
+/* The reference to the string table deliberately holds its rounded length: behind it stand the variable IDs. */
+void add_var_class(cdgen &cx, const rsrc_variable_class_t &staged) {
+    section out(cx, CDB_DSECT_VAR_CLASS);
+    char *at = out.write(&staged, sizeof staged);
+    rsrc_variable_class_t record = staged;
+    record.u_rvc_string_tbl = {{out.write_rounded(staged_content(staged.u_rvc_string_tbl)), 0}};
+    out.write_rounded(find_tbl_entry(cx, &staged));
+    store(at, record);
+    out.finish();
+}
+
+/* Adds a section for each record of a staged table. */
+template <class Record, class Add> void add_all(cdgen &cx, tbl *t, const char *missing, Add add) {
+    if (t->tbl_base == nullptr)
+        bld_error_exit(cx, missing, nullptr, nullptr, 1);
+    for (const Record &record : records_of<Record>(t))
+        add(cx, record);
+}
+
+/* The largest number among the records of a staged table, 0 if there is none. */
+template <class Record> vx_uint16_t max_id(tbl *t, vx_uint16_t Record::*id) {
+    vx_uint16_t max = 0;
+    for (const Record &record : records_of<Record>(t))
+        max = std::max(max, record.*id);
+    return max;
+}
+
+/* ---- The header ------------------------------------------------------------------------------------------------ */
+
+orb_timeval32_t timestamp() {
+    if (getenv("VX_CDB_FORCE_EMPTY_TIMESTAMP") != nullptr)
+        return {0, 0};
+    timeval now = {};
+    gettimeofday(&now, nullptr);
+    return {static_cast<vx_uint32_t>(now.tv_sec), static_cast<vx_uint32_t>(now.tv_usec)};
+}
+
+void write_header(cdgen &cx) {
+    auto header = load<orb_cdb_header_t>(cx.chp); /* the maximum IDs are there already */
+    header.cdb_hdr_length = static_cast<vx_uint32_t>(cx.dsp - cx.chp - 4);
+    header.cdb_hdr_format = CDB_FORMAT;
+    header.cdb_hdr_seqno = 0;
+    header.cdb_hdr_timestamp = timestamp();
+    header.cdb_hdr_dsect_count = static_cast<vx_uint32_t>(cx.dsect_count);
+    header.cdb_hdr_rsrc_class_size = sizeof(rsrc_class_t);
+    header.cdb_hdr_rsrc_cmmap_size = sizeof(rsrc_cmmap_t);
+    header.cdb_hdr_rsrc_mgr_size = sizeof(rsrc_mgr_t);
+    header.cdb_hdr_rsrc_variable_class_size = sizeof(rsrc_variable_class_t);
+    header.cdb_hdr_rsrc_pattr_size = sizeof(rsrc_pattr_t);
+    header.cdb_hdr_rsrc_dattr_size = sizeof(rsrc_dattr_t);
+    header.cdb_hdr_rsrc_action_size = sizeof(rsrc_action_t);
+    header.cdb_hdr_rsrc_error_size = sizeof(rsrc_error_t);
+    header.cdb_hdr_rsrc_depend_size = sizeof(rsrc_depend_t);
+    store(cx.chp, header);
+    header.cdb_hdr_checksum = cdb_checksum(cx.chp, header.cdb_hdr_length, header.cdb_hdr_length);
+    store(cx.chp, header);
+}
+
+} // namespace
+
+vx_uint32_t cdb_checksum(const char *image, vx_uint32_t start, vx_uint32_t length) {
+    const char *word = image + offsetof(orb_cdb_header_t, cdb_hdr_format);
+    size_t words = (length - 4) / 4;
+    std::array<vx_uint64_t, 4> sums = {}; /* two words at a time in each: XOR does not mind the order */
+    for (; words >= 8; words -= 8)
+        for (vx_uint64_t &sum : sums) {
+            sum ^= load<vx_uint64_t>(word);
+            word += sizeof sum;
+        }
+    vx_uint64_t pairs = sums[0] ^ sums[1] ^ sums[2] ^ sums[3];
+    vx_uint32_t sum = start ^ static_cast<vx_uint32_t>(pairs) ^ static_cast<vx_uint32_t>(pairs >> 32);
+    for (; words > 0; --words, word += sizeof sum)
+        sum ^= load<vx_uint32_t>(word);
+    return sum;
+}
+
+size_t cdb_size(cdgen &cx) {
+    size_t size = sizeof(orb_cdb_header_t) + sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.dsect_count);
+    for (const auto &vc : records_of<rsrc_variable_class_t>(&cx.rsrc_var_class_tbl))
+        size += sizeof vc + strings_size(cx, vc.u_rvc_string_tbl) + round8(sizeof(var_id_t) * vc.rvc_var_count);
+    for (const auto &map : records_of<rsrc_cmmap_t>(&cx.rsrc_cmmap_tbl))
+        size += sizeof map + strings_size(cx, map.u_rcm_strings);
+    for (auto &rc : records_of<rsrc_class_t>(&cx.rsrc_class_tbl))
+        size += class_size(cx, rc);
+    for (const auto &mgr : records_of<rsrc_mgr_t>(&cx.rsrc_mgr_tbl))
+        size += sizeof mgr + strings_size(cx, mgr.u_rm_strings_table);
+    return checked_size(cx, size);
+}
+
+void add_rsrc_class_tbls(cdgen &cx) {
+    add_all<rsrc_class_t>(cx, &cx.rsrc_class_tbl, "No Rsrc Class Tables found", add_class);
+    store(cx.chp + offsetof(orb_cdb_header_t, cdb_hdr_max_class_id),
+          max_id(&cx.rsrc_class_tbl, &rsrc_class_t::rc_class_id));
+}
+
+void add_rsrc_mgr_tbls(cdgen &cx) {
+    add_all<rsrc_mgr_t>(cx, &cx.rsrc_mgr_tbl, "No Rsrc Manager tables", add_mgr);
+    store(cx.chp + offsetof(orb_cdb_header_t, cdb_hdr_max_rm_id), max_id(&cx.rsrc_mgr_tbl, &rsrc_mgr_t::rm_id));
+}
+
+void add_rsrc_cmmap_tbls(cdgen &cx) {
+    add_all<rsrc_cmmap_t>(cx, &cx.rsrc_cmmap_tbl, "No Rsrc CMMAP tables", add_cmmap);
+}
+
+void add_rsrc_var_class_tbls(cdgen &cx) {
+    add_all<rsrc_variable_class_t>(cx, &cx.rsrc_var_class_tbl, "No Rsrc Variable Class tables", add_var_class);
+}
+
+size_t fit_image(cdgen &cx) {
+    cx.dsect_count = cx.rsrc_cmmap_count + cx.rsrc_mgr_count + cx.rsrc_var_class_count + cx.rsrc_class_count;
+    return cdb_size(cx);
+}
+
+void bld_cdb(cdgen &cx) {
+    cx.chp = get_mapfile(cx, fit_image(cx));
+    cx.dsect_anchs = cx.chp + sizeof(orb_cdb_header_t);
+    cx.dsect_idx = 0;
+    cx.dsp = cx.dsect_anchs + sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.dsect_count);
+    add_rsrc_class_tbls(cx);
+    add_rsrc_mgr_tbls(cx);
+    add_rsrc_cmmap_tbls(cx);
+    if (cx.rsrc_var_class_tbl.tbl_base != nullptr)
+        add_rsrc_var_class_tbls(cx);
+    write_header(cx);
+    flush_mapfile(cx);
+}
+
+void discard_mapfile(cdgen &cx) {
+    if (cx.cdb_mapfile_fd <= 0)
+        return;
+    if (cx.cdb_mapfile_ptr != nullptr)
+        munmap(std::exchange(cx.cdb_mapfile_ptr, nullptr), cx.gross_file_size);
+    close(std::exchange(cx.cdb_mapfile_fd, 0));
+    remove(cx.cdefname);
+}
+
+void bld_error_exit(cdgen &cx, const char *msg, const char *detail1, const char *detail2, int code) {
+    discard_mapfile(cx);
+    throw fatal_exit{msg, detail1, detail2, 0, code};
+}

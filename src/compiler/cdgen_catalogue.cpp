@@ -1,0 +1,291 @@
+/* cdgen_catalogue.cpp: the source language as data: stanza kinds, their attributes, property and permission names. */
+
+#include "compiler/cdgen.h"
+
+#include <string_view>
+
+namespace {
+
+constexpr int ONCE = 0;
+constexpr int REPEAT = 1;
+
+/* One attribute: the field it fills names record and member. */
+#define ATTR(name, type, record, field, bit, repeat)                                                                   \
+    table_attrs {                                                                                                      \
+        name, type, offsetof(record, field), bit, repeat                                                               \
+    }
+
+constexpr table_attrs control_attrs[] = {
+    ATTR("FileVersion", AT_VERSION, rsrc_class_t, rc_version, 0x1, ONCE),
+};
+
+constexpr table_attrs cmmap_attrs[] = {
+    ATTR("ResourceManager", AT_MANAGER, rsrc_cmmap_t, rcm_rm_ID, 0x1, ONCE),
+    ATTR("FirstKey", AT_UINT16, rsrc_cmmap_t, rcm_first_key, 0x2, ONCE),
+    ATTR("LastKey", AT_UINT16, rsrc_cmmap_t, rcm_last_key, 0x4, ONCE),
+    ATTR("MessageCatalog", AT_STRING, rsrc_cmmap_t, u_rcm_msg_file, 0x8, ONCE),
+    ATTR("DescriptiveMessageSet", AT_UINT16, rsrc_cmmap_t, rcm_dscr_msg_set, 0x10, ONCE),
+};
+
+constexpr table_attrs variable_class_attrs[] = {
+    ATTR("ObservationInterval", AT_UINT16, rsrc_variable_class_t, rvc_obsv_interval, 0x2, ONCE),
+    ATTR("ReportingInterval", AT_UINT16, rsrc_variable_class_t, rvc_report_interval, 0x4, ONCE),
+    ATTR("VariableClass", AT_STRING, rsrc_variable_class_t, u_rvc_name, 0x1, ONCE),
+    ATTR("Alias", AT_STRING, rsrc_variable_class_t, u_rvc_compat_name, OPTIONAL | 0x1, ONCE),
+};
+
+constexpr table_attrs class_attrs[] = {
+    ATTR("Properties", AT_CLASS_PROPS, rsrc_class_t, rc_props, 0x4, ONCE),
+    ATTR("ClassPermTemplate", AT_PERM_TEMPLATE, rsrc_class_t, rc_perm_tempC, 0x8, ONCE),
+    ATTR("ResourcePermTemplate", AT_PERM_TEMPLATE, rsrc_class_t, rc_perm_temp, 0x10, ONCE),
+    ATTR("Locator", AT_LOCATOR, rsrc_class_t, rc_locator, OPTIONAL | 0x2, ONCE),
+    ATTR("Description", AT_UINT16, rsrc_class_t, rc_dscr_msgid, 0x1, ONCE),
+    ATTR("DisplayName", AT_UINT16, rsrc_class_t, rc_disp_msgid, 0x2, ONCE),
+    ATTR("Name", AT_STRING, rsrc_class_t, u_rc_name, OPTIONAL | 0x10, ONCE),
+};
+
+constexpr table_attrs pattr_attrs[] = {
+    ATTR("Name", AT_STRING, rsrc_pattr_t, u_ra_name, 0x1, ONCE),
+    ATTR("Description", AT_UINT16, rsrc_pattr_t, ra_dscr_msgid, 0x2, ONCE),
+    ATTR("DisplayName", AT_UINT16, rsrc_pattr_t, ra_disp_msgid, 0x4, ONCE),
+    ATTR("Id", AT_ID, rsrc_pattr_t, ra_attr_id, 0x8, ONCE),
+    ATTR("DataType", AT_DATA_TYPE, rsrc_pattr_t, ra_data_type, 0x10, ONCE),
+    ATTR("VarietyRange", AT_VARIETY, rsrc_pattr_t, u_ra_variety_list, 0x20, REPEAT),
+    ATTR("GroupID", AT_UINT16, rsrc_pattr_t, ra_group_id, OPTIONAL | 0x1, ONCE),
+    ATTR("GroupName", AT_UINT16, rsrc_pattr_t, ra_group_msgid, OPTIONAL | 0x2, ONCE),
+    ATTR("Properties", AT_PATTR_PROPS, rsrc_pattr_t, ra_props, OPTIONAL | 0x4, ONCE),
+    ATTR("ValidValue", AT_VALID_VALUE, rsrc_pattr_t, u_ra_valid_vals, OPTIONAL | 0x10, REPEAT),
+    /* The field of these three is the latest valid value's, or none. */
+    ATTR("ValueDisplayName", AT_VALUE_DISPLAY, rsrc_pattr_t, u_ra_valid_vals, OPTIONAL | 0x20, REPEAT),
+    ATTR("DefaultValue", AT_DEFAULT_VALUE, rsrc_pattr_t, ra_dflt_value, OPTIONAL | 0x8, REPEAT),
+    ATTR("ListActionRsrc", AT_LIST_ACTION_RSRC, rsrc_pattr_t, ra_cb_ID, OPTIONAL | 0x40, ONCE),
+    ATTR("ListActionClass", AT_LIST_ACTION_CLASS, rsrc_pattr_t, ra_cb_ID, OPTIONAL | 0x80, ONCE),
+};
+
+constexpr table_attrs dattr_attrs[] = {
+    ATTR("Name", AT_STRING, rsrc_dattr_t, u_ra_name, 0x1, ONCE),
+    ATTR("VariableClass", AT_STRING, rsrc_dattr_t, u_ra_vclass, OPTIONAL | 0x100, ONCE),
+    ATTR("Description", AT_UINT16, rsrc_dattr_t, ra_dscr_msgid, 0x2, ONCE),
+    ATTR("DisplayName", AT_UINT16, rsrc_dattr_t, ra_disp_msgid, 0x4, ONCE),
+    ATTR("Id", AT_ID, rsrc_dattr_t, ra_attr_id, 0x8, ONCE),
+    ATTR("DataType", AT_DATA_TYPE, rsrc_dattr_t, ra_data_type, 0x10, ONCE),
+    ATTR("VariableType", AT_VARIABLE_TYPE, rsrc_dattr_t, ra_var_type, 0x40, ONCE),
+    ATTR("VarietyRange", AT_VARIETY, rsrc_dattr_t, u_ra_variety_list, 0x20, REPEAT),
+    ATTR("GroupID", AT_UINT16, rsrc_dattr_t, ra_group_id, OPTIONAL | 0x1, ONCE),
+    ATTR("GroupName", AT_UINT16, rsrc_dattr_t, ra_group_msgid, OPTIONAL | 0x2, ONCE),
+    ATTR("Properties", AT_DATTR_PROPS, rsrc_dattr_t, ra_props, OPTIONAL | 0x4, ONCE),
+    ATTR("InitialValue", AT_INITIAL_VALUE, rsrc_dattr_t, ra_init_value, OPTIONAL | 0x8, ONCE),
+    ATTR("ValidStateValue", AT_VALID_VALUE, rsrc_dattr_t, u_ra_valid_vals, OPTIONAL | 0x10, REPEAT),
+    ATTR("ValueDisplayName", AT_VALUE_DISPLAY, rsrc_dattr_t, u_ra_valid_vals, OPTIONAL | 0x20, REPEAT),
+    ATTR("Expression", AT_STRING, rsrc_dattr_t, u_ra_express, OPTIONAL | 0x400, ONCE),
+    ATTR("ExpressionDescription", AT_UINT16, rsrc_dattr_t, ra_expr_desc, OPTIONAL | 0x800, ONCE),
+    ATTR("ReArmExpression", AT_STRING, rsrc_dattr_t, u_ra_rearm_expr, OPTIONAL | 0x1000, ONCE),
+    ATTR("ReArmDescription", AT_UINT16, rsrc_dattr_t, ra_rearm_desc, OPTIONAL | 0x2000, ONCE),
+    /* Fills ra_min_value too. */
+    ATTR("Range", AT_RANGE, rsrc_dattr_t, ra_max_value, OPTIONAL | 0x200, ONCE),
+    ATTR("ListActionRsrc", AT_LIST_ACTION_RSRC, rsrc_dattr_t, ra_cb_ID, OPTIONAL | 0x40, ONCE),
+    ATTR("ListActionClass", AT_LIST_ACTION_CLASS, rsrc_dattr_t, ra_cb_ID, OPTIONAL | 0x80, ONCE),
+};
+
+constexpr table_attrs action_attrs[] = {
+    ATTR("Name", AT_STRING, rsrc_action_t, u_ac_name, 0x1, ONCE),
+    ATTR("Description", AT_UINT16, rsrc_action_t, ac_dscr_msgid, 0x2, ONCE),
+    ATTR("DisplayName", AT_UINT16, rsrc_action_t, ac_disp_msgid, 0x4, ONCE),
+    ATTR("Id", AT_ID, rsrc_action_t, ac_action_id, 0x8, ONCE),
+    ATTR("VarietyRange", AT_VARIETY, rsrc_action_t, u_ac_variety_list, 0x10, REPEAT),
+    ATTR("Properties", AT_ACTION_PROPS, rsrc_action_t, ac_props, OPTIONAL | 0x1, ONCE),
+    ATTR("Permission", AT_PERMISSION, rsrc_action_t, ac_perms, OPTIONAL | 0x4, ONCE),
+    ATTR("ConfirmationMsg", AT_UINT16, rsrc_action_t, ac_confirm_msgid, OPTIONAL | 0x8, ONCE),
+    ATTR("TimeOut", AT_UINT16, rsrc_action_t, ac_timeout, OPTIONAL | 0x2, ONCE),
+};
+
+/* Fields of the one element that is staged at a time. */
+#define SD_ATTR(name, type, field, bit, repeat)                                                                        \
+    table_attrs {                                                                                                      \
+        name, type, offsetof(sd_def_t, sd_fields) + offsetof(sd_field_t, field), bit, repeat                           \
+    }
+
+constexpr table_attrs sd_attrs[] = {
+    SD_ATTR("ElementName", AT_SD_NAME, u_sd_field_name, 0x1, ONCE),
+    SD_ATTR("Description", AT_SD_DESCRIPTION, sd_dscr_msgid, 0x2, ONCE),
+    SD_ATTR("DisplayName", AT_SD_DISPLAY, sd_disp_msgid, 0x4, ONCE),
+    /* Checked only. */
+    SD_ATTR("ElementIndex", AT_SD_INDEX, sd_reserved, 0x8, ONCE),
+    SD_ATTR("DataType", AT_SD_DATA_TYPE, sd_field_type, 0x10, ONCE),
+    SD_ATTR("ValidValue", AT_SD_VALID_VALUE, u_sd_valid_vals, OPTIONAL | 0x2, REPEAT),
+    SD_ATTR("ValueDisplayName", AT_SD_VALUE_DISPLAY, u_sd_valid_vals, OPTIONAL | 0x4, REPEAT),
+    /* Rejected. */
+    SD_ATTR("DefaultValue", AT_SD_DEFAULT_VALUE, sd_reserved, OPTIONAL | 0x1, REPEAT),
+};
+
+constexpr vx_uint32_t required_mask(std::span<const table_attrs> attrs) {
+    vx_uint32_t mask = 0;
+    for (const table_attrs &attr : attrs)
+        if ((attr.req_bit & OPTIONAL) == 0)
+            mask |= attr.req_bit;
+    return mask;
+}
+
+/* Deliberate: 0x20 and 0x40 belong to no attribute, so that no ActionOut element is ever complete and none takes an
+ * optional attribute. */
+constexpr vx_uint32_t ACTION_OUT_MASK = required_mask(sd_attrs) | 0x20 | 0x40;
+
+#define ATTR_KIND(record, vv_found, sd_attr_type, value)                                                               \
+    attr_kind {                                                                                                        \
+        &cdgen::vv_found, sd_attr_type, offsetof(record, value), offsetof(record, u_ra_sd),                            \
+            offsetof(record, ra_max_sd_idx)                                                                            \
+    }
+
+constexpr attr_kind pattr_kind = ATTR_KIND(rsrc_pattr_t, pattr_vv_found, 0, ra_dflt_value);
+constexpr attr_kind pattrC_kind = ATTR_KIND(rsrc_pattr_t, pattrC_vv_found, 0, ra_dflt_value);
+constexpr attr_kind dattr_kind = ATTR_KIND(rsrc_dattr_t, dattr_vv_found, 1, ra_init_value);
+constexpr attr_kind dattrC_kind = ATTR_KIND(rsrc_dattr_t, dattrC_vv_found, 1, ra_init_value);
+
+constexpr sd_owner pattr_owner = {SD_TYPE_PATTR, nullptr, nullptr};
+constexpr sd_owner dattr_owner = {SD_TYPE_DATTR, nullptr, nullptr};
+constexpr sd_owner define_owner = {SD_TYPE_DEFINE, &rsrc_class_t::u_rc_def_input, nullptr};
+constexpr sd_owner undefine_owner = {SD_TYPE_UNDEFINE, &rsrc_class_t::u_rc_undef_input, nullptr};
+constexpr sd_owner online_owner = {SD_TYPE_ONLINE, &rsrc_class_t::u_rc_online_input, nullptr};
+constexpr sd_owner offline_owner = {SD_TYPE_OFFLINE, &rsrc_class_t::u_rc_offline_input, nullptr};
+constexpr sd_owner reset_owner = {SD_TYPE_RESET, &rsrc_class_t::u_rc_reset_input, nullptr};
+constexpr sd_owner action_in_owner = {SD_TYPE_ACT_IN, nullptr, &rsrc_action_t::u_ac_sd_input};
+constexpr sd_owner action_out_owner = {SD_TYPE_ACT_RESP, nullptr, &rsrc_action_t::u_ac_sd_resp};
+
+template <std::size_t Count> consteval name_index names_of(const table_attrs (&attrs)[Count]) {
+    return {Count, [&](std::size_t i) { return std::string_view(attrs[i].ta_name); }};
+}
+
+template <auto Record> void *record(cdgen &cx) {
+    return &(cx.*Record);
+}
+
+template <auto Record, auto Field> tbl *table(cdgen &cx) {
+    return staged_tbl((cx.*Record).*Field);
+}
+
+tbl *no_table(cdgen &) {
+    return nullptr;
+}
+
+constexpr auto class_record = &cdgen::cb_rsrc_class;
+constexpr auto class_strings = &table<class_record, &rsrc_class_t::u_rc_strings>;
+constexpr auto class_varieties = &table<class_record, &rsrc_class_t::u_rc_variety_lists>;
+constexpr auto class_valid_vals = &table<class_record, &rsrc_class_t::u_rc_valid_vals>;
+constexpr auto class_sd_defs = &table<class_record, &rsrc_class_t::u_rc_sd_defs>;
+constexpr auto cmmap_strings = &table<&cdgen::cb_rsrc_cmmap, &rsrc_cmmap_t::u_rcm_strings>;
+constexpr auto variable_class_strings =
+    &table<&cdgen::cb_rsrc_variable_class, &rsrc_variable_class_t::u_rvc_string_tbl>;
+
+/* A kind that stores into the open class's tables: all but two. */
+template <auto Record, std::size_t Count>
+consteval srtable_ctrl of_class(const char *name, const table_attrs (&attrs)[Count], void (*init)(cdgen &),
+                                int dt_offset = -1, const attr_kind *kind = nullptr, const sd_owner *owner = nullptr) {
+    return {.sc_name = name,
+            .sc_cb = record<Record>,
+            .sc_attrs = attrs,
+            .sc_attr_names = names_of(attrs),
+            .sc_init_tbl = init,
+            .req_mask_cmplt = required_mask(attrs),
+            .sc_str_tbl = class_strings,
+            .sc_vty_tbl = class_varieties,
+            .sc_vv_tbl = class_valid_vals,
+            .sc_sd_tbl = class_sd_defs,
+            .dt_offset = dt_offset,
+            .sc_attr = kind,
+            .sc_sd_owner = owner};
+}
+
+consteval srtable_ctrl sd_stanza(const char *name, const sd_owner &owner,
+                                 vx_uint32_t complete = required_mask(sd_attrs)) {
+    srtable_ctrl row = of_class<&cdgen::cb_sd_def>(name, sd_attrs, init_sd_tbl,
+                                                   offsetof(sd_def_t, sd_fields) + offsetof(sd_field_t, sd_field_type),
+                                                   nullptr, &owner);
+    row.req_mask_cmplt = complete;
+    return row;
+}
+
+constexpr int PATTR_TYPE = offsetof(rsrc_pattr_t, ra_data_type);
+constexpr int DATTR_TYPE = offsetof(rsrc_dattr_t, ra_data_type);
+
+constexpr std::array<srtable_ctrl, SC_COUNT + 1> catalogue = {{
+    of_class<class_record>("ControlDefinition", control_attrs, init_class_tbl),
+    {.sc_name = "ClassToManagerMapping",
+     .sc_cb = record<&cdgen::cb_rsrc_cmmap>,
+     .sc_attrs = cmmap_attrs,
+     .sc_attr_names = names_of(cmmap_attrs),
+     .sc_init_tbl = init_cmmap_tbl,
+     .req_mask_cmplt = required_mask(cmmap_attrs),
+     .sc_str_tbl = cmmap_strings,
+     .sc_vty_tbl = no_table,
+     .sc_vv_tbl = no_table,
+     .sc_sd_tbl = no_table,
+     .dt_offset = -1,
+     .sc_attr = nullptr,
+     .sc_sd_owner = nullptr},
+    {.sc_name = "ResourceVariableClass",
+     .sc_cb = record<&cdgen::cb_rsrc_variable_class>,
+     .sc_attrs = variable_class_attrs,
+     .sc_attr_names = names_of(variable_class_attrs),
+     .sc_init_tbl = init_var_class_tbl,
+     .req_mask_cmplt = required_mask(variable_class_attrs),
+     .sc_str_tbl = variable_class_strings,
+     .sc_vty_tbl = no_table,
+     .sc_vv_tbl = no_table,
+     .sc_sd_tbl = class_sd_defs,
+     .dt_offset = -1,
+     .sc_attr = nullptr,
+     .sc_sd_owner = nullptr},
+    of_class<class_record>("ResourceClass", class_attrs, init_class_tbl_fake),
+    of_class<&cdgen::cb_rsrc_pattr>("PersistentResourceAttribute", pattr_attrs, init_pattr_tbl, PATTR_TYPE,
+                                    &pattr_kind),
+    of_class<&cdgen::cb_rsrc_pattrC>("PersistentClassAttribute", pattr_attrs, init_pattrC_tbl, PATTR_TYPE,
+                                     &pattrC_kind),
+    of_class<&cdgen::cb_rsrc_dattr>("DynamicResourceAttribute", dattr_attrs, init_dattr_tbl, DATTR_TYPE, &dattr_kind),
+    of_class<&cdgen::cb_rsrc_dattrC>("DynamicClassAttribute", dattr_attrs, init_dattrC_tbl, DATTR_TYPE, &dattrC_kind),
+    of_class<&cdgen::cb_rsrc_actionC>("ClassAction", action_attrs, init_actionC_tbl),
+    of_class<&cdgen::cb_rsrc_action>("ResourceAction", action_attrs, init_action_tbl),
+    sd_stanza("PAttrSDDefinition", pattr_owner),
+    sd_stanza("DAttrSDDefinition", dattr_owner),
+    sd_stanza("DefineSDDefinition", define_owner),
+    sd_stanza("UndefineSDDefinition", undefine_owner),
+    sd_stanza("OnlineSDDefinition", online_owner),
+    sd_stanza("OfflineSDDefinition", offline_owner),
+    sd_stanza("ResetSDDefinition", reset_owner),
+    sd_stanza("ActionInSDDefinition", action_in_owner),
+    sd_stanza("ActionOutSDDefinition", action_out_owner, ACTION_OUT_MASK),
+    {},
+}};
+
+constexpr name_index stanza_names(SC_COUNT, [](std::size_t i) { return std::string_view(catalogue[i].sc_name); });
+
+/* The stanzas that the assembly reaches by index instead of by name. */
+constexpr bool named(stanza_id id, std::string_view name) {
+    return catalogue[id].sc_name == name;
+}
+static_assert(named(SC_RESOURCE_CLASS, "ResourceClass"), "ResourceClass table not found");
+static_assert(named(SC_PERSISTENT_RESOURCE_ATTRIBUTE, "PersistentResourceAttribute"),
+              "PersistentResourceAttribute table not found; PersistentResourceAttribute table missing");
+static_assert(named(SC_PERSISTENT_CLASS_ATTRIBUTE, "PersistentClassAttribute"),
+              "PersistentClassAttribute table not found");
+static_assert(named(SC_DYNAMIC_RESOURCE_ATTRIBUTE, "DynamicResourceAttribute"),
+              "DynamicResourceAttribute table not found");
+static_assert(named(SC_DYNAMIC_CLASS_ATTRIBUTE, "DynamicClassAttribute"), "DynamicClassAttribute table not found");
+static_assert(named(SC_RESOURCE_ACTION, "ResourceAction"), "Resource Action table not found");
+static_assert(named(SC_CLASS_ACTION, "ClassAction"), "Class Action table not found");
+
+} // namespace
+
+constinit const std::array<srtable_ctrl, SC_COUNT + 1> sc_tables = catalogue;
+
+int set_table_id(const char *name) {
+    int id = stanza_names.candidate(name);
+    return id >= 0 && strcmp(sc_tables[static_cast<size_t>(id)].sc_name, name) == 0 ? id : -1;
+}
+
+const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name) {
+    int at = scp.sc_attr_names.candidate(name);
+    if (at < 0)
+        return nullptr;
+    const table_attrs &attr = scp.sc_attrs[static_cast<size_t>(at)];
+    return name.size() == attr.ta_length && memcmp(name.data(), attr.ta_name, attr.ta_length) == 0 ? &attr : nullptr;
+}

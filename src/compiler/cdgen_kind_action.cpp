@@ -1,0 +1,66 @@
+/* cdgen_kind_action.cpp: actions of resources and of classes. */
+
+#include "compiler/cdgen_kind.h"
+
+namespace {
+
+constexpr vx_uint32_t PERMISSION_BIT = OPTIONAL | 0x4;
+constexpr vx_uint32_t DEFAULT_PERMISSION = 0x40; /* letter s */
+
+/* What sets the two kinds apart. */
+struct action_kind {
+    stanza_id id;
+    rsrc_action_t cdgen::*record;
+    cdb_ref_t rsrc_class_t::*records;
+    vx_uint32_t cb_id;
+};
+
+constexpr action_kind resource_kind = {SC_RESOURCE_ACTION, &cdgen::cb_rsrc_action, &rsrc_class_t::u_rc_actions,
+                                       CDB_ID_ACTION};
+constexpr action_kind class_kind = {SC_CLASS_ACTION, &cdgen::cb_rsrc_actionC, &rsrc_class_t::u_rc_actionsC,
+                                    CDB_ID_ACTION_C};
+
+constexpr const char *NO_CLASS = "No class for class action"; /* deliberately for both kinds */
+
+void complete_action(cdgen &cx, const action_kind &kind) {
+    rsrc_action_t &action = cx.*kind.record;
+    cx.completing = kind.id;
+    require_class(cx, NO_CLASS);
+    require_complete(cx, kind.id);
+    if (!was_given(cx.stanzas[kind.id], PERMISSION_BIT))
+        action.ac_perms = DEFAULT_PERMISSION;
+    append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), action);
+    action.ac_cb_ID = 0;
+    cx.completing = -1;
+}
+
+void start_action(cdgen &cx, const action_kind &kind) {
+    rsrc_action_t &action = cx.*kind.record;
+    require_class(cx, NO_CLASS);
+    if (action.ac_cb_ID != 0)
+        complete_action(cx, kind);
+    action = {};
+    action.ac_cb_ID = kind.cb_id;
+    action.u_ac_variety_list.offset[0] = mk_vty_sec(cx);
+    mark_absent(action.u_ac_sd_input);
+    mark_absent(action.u_ac_sd_resp);
+    cx.vvdisp.reset();
+}
+
+} // namespace
+
+void init_action_tbl(cdgen &cx) {
+    start_action(cx, resource_kind);
+}
+
+void cmplt_action_tbl(cdgen &cx) {
+    complete_action(cx, resource_kind);
+}
+
+void init_actionC_tbl(cdgen &cx) {
+    start_action(cx, class_kind);
+}
+
+void cmplt_actionC_tbl(cdgen &cx) {
+    complete_action(cx, class_kind);
+}

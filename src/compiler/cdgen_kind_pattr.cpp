@@ -1,0 +1,105 @@
+/* cdgen_kind_pattr.cpp: persistent attributes of resources and of classes. */
+
+#include "compiler/cdgen_kind.h"
+
+namespace {
+
+constexpr vx_uint32_t REQD_FOR_DEFINE = 0x2;
+constexpr vx_uint32_t INVAL_FOR_DEFINE = 0x4;
+constexpr vx_uint32_t OPT_FOR_DEFINE = 0x8;
+
+/* What sets the two kinds apart. */
+struct pattr_kind {
+    stanza_id id;
+    rsrc_pattr_t cdgen::*record;
+    cdb_ref_t rsrc_class_t::*records;
+    vx_uint32_t cb_id;
+    const char *no_class;
+    bool valid_vals_absent_at_open; /* deliberate: the resource kind marks them at its completion only */
+    bool uses_default_values;       /* deliberate: the class kind's DefaultValue lines are never used */
+};
+
+constexpr pattr_kind resource_kind = {.id = SC_PERSISTENT_RESOURCE_ATTRIBUTE,
+                                      .record = &cdgen::cb_rsrc_pattr,
+                                      .records = &rsrc_class_t::u_rc_pattrs,
+                                      .cb_id = CDB_ID_PATTR,
+                                      .no_class = "No class for PersistentAttribute",
+                                      .valid_vals_absent_at_open = false,
+                                      .uses_default_values = true};
+constexpr pattr_kind class_kind = {.id = SC_PERSISTENT_CLASS_ATTRIBUTE,
+                                   .record = &cdgen::cb_rsrc_pattrC,
+                                   .records = &rsrc_class_t::u_rc_pattrsC,
+                                   .cb_id = CDB_ID_PATTR_C,
+                                   .no_class = "No class for pattr",
+                                   .valid_vals_absent_at_open = true,
+                                   .uses_default_values = false};
+
+vx_uint16_t &valid_vals_found(cdgen &cx, const pattr_kind &kind) {
+    return cx.*(sc_tables[kind.id].sc_attr->vv_found);
+}
+
+/* Structured data get their default from the SD stanzas that follow. */
+void settle_default(cdgen &cx, const pattr_kind &kind, rsrc_pattr_t &attr) {
+    if (scalar_vx(attr.ra_data_type) == VX_SD_PTR)
+        return;
+    tbl *strings = staged_tbl(cx.cb_rsrc_class.u_rc_strings);
+    const dflt_tbl &dflt = cx.stanzas[kind.id].dflt;
+    tbl_anchor array;
+    if (kind.uses_default_values && has_values(dflt))
+        dump_dflt(cx, strings, &dflt, &attr.ra_dflt_value, attr.ra_data_type);
+    else if (copy_this_type(cx, &attr.ra_dflt_value, nullptr, attr.ra_data_type, DFLT_DEFAULT, strings, &array, 1) != 0)
+        source_error(cx, "copy_this_type default value error");
+}
+
+void open_pattr(cdgen &cx, const pattr_kind &kind) {
+    rsrc_pattr_t &attr = cx.*kind.record;
+    attr = {};
+    attr.ra_cb_ID = kind.cb_id;
+    attr.u_ra_variety_list.offset[0] = mk_vty_sec(cx);
+    mark_absent(attr.u_ra_sd);
+    if (kind.valid_vals_absent_at_open)
+        mark_absent(attr.u_ra_valid_vals);
+    attr.ra_max_sd_idx = NO_SD_IDX;
+    cx.vvdisp.reset();
+    valid_vals_found(cx, kind) = 0;
+}
+
+void complete_pattr(cdgen &cx, const pattr_kind &kind) {
+    rsrc_pattr_t &attr = cx.*kind.record;
+    cx.completing = kind.id;
+    require_class(cx, kind.no_class);
+    require_complete(cx, kind.id);
+    settle_valid_vals(attr, valid_vals_found(cx, kind));
+    settle_default(cx, kind, attr);
+    if ((attr.ra_props & (REQD_FOR_DEFINE | OPT_FOR_DEFINE)) == 0)
+        attr.ra_props |= INVAL_FOR_DEFINE;
+    settle_group(attr, cx.stanzas[kind.id]);
+    append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), attr);
+    attr.ra_cb_ID = 0;
+    cx.completing = -1;
+}
+
+void start_pattr(cdgen &cx, const pattr_kind &kind) {
+    require_class(cx, kind.no_class);
+    if ((cx.*kind.record).ra_cb_ID != 0)
+        complete_pattr(cx, kind);
+    open_pattr(cx, kind);
+}
+
+} // namespace
+
+void init_pattr_tbl(cdgen &cx) {
+    start_pattr(cx, resource_kind);
+}
+
+void cmplt_pattr_tbl(cdgen &cx) {
+    complete_pattr(cx, resource_kind);
+}
+
+void init_pattrC_tbl(cdgen &cx) {
+    start_pattr(cx, class_kind);
+}
+
+void cmplt_pattrC_tbl(cdgen &cx) {
+    complete_pattr(cx, class_kind);
+}

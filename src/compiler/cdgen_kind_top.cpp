@@ -1,0 +1,154 @@
+/* cdgen_kind_top.cpp: class-to-manager maps, managers, variable classes and resource classes. */
+
+#include "compiler/cdgen_kind.h"
+
+#include <cstdlib>
+#include <type_traits>
+
+namespace {
+
+constexpr size_t STRINGS_AU = 8192;
+
+/* A side table of the class: the field that refers to it, and how it grows. */
+struct class_table {
+    cdb_ref_t rsrc_class_t::*field;
+    const char *name;
+    size_t au;
+};
+
+/* In the order in which they are made. */
+constexpr class_table class_tables[] = {
+    {&rsrc_class_t::u_rc_pattrsC, "ClassPattrsC", 16 * sizeof(rsrc_pattr_t)},
+    {&rsrc_class_t::u_rc_dattrsC, "ClassDattrsC", 16 * sizeof(rsrc_dattr_t)},
+    {&rsrc_class_t::u_rc_pattrs, "ClassPattrs", 16 * sizeof(rsrc_pattr_t)},
+    {&rsrc_class_t::u_rc_dattrs, "ClassDattrs", 16 * sizeof(rsrc_dattr_t)},
+    {&rsrc_class_t::u_rc_actionsC, "ClassActionsC", 4 * sizeof(rsrc_action_t)},
+    {&rsrc_class_t::u_rc_actions, "ClassActions", 4 * sizeof(rsrc_action_t)},
+    {&rsrc_class_t::u_rc_errors, "ClassErrors", 4 * sizeof(rsrc_error_t)},
+    {&rsrc_class_t::u_rc_depends, "ClassDepends", 4 * sizeof(rsrc_depend_t)},
+    {&rsrc_class_t::u_rc_sbs_defs, "ClassSBSDefs", 8 * sizeof(sbs_def_t)},
+    {&rsrc_class_t::u_rc_valid_vals, "ClassValidVals", 8 * sizeof(valid_values_t)},
+    {&rsrc_class_t::u_rc_variety_lists, "ClassVarietyList", 4 * sizeof(variety_list_t)},
+    {&rsrc_class_t::u_rc_strings, "ClassStrings", STRINGS_AU},
+    {&rsrc_class_t::u_rc_sd_defs, "ClassSDDefs", 4 * sizeof(sd_def_t)},
+};
+
+/* Absent until a stanza says otherwise. (Those of side tables are taken by their tables at once.) */
+constexpr cdb_ref_t rsrc_class_t::*absent_at_open[] = {
+    &rsrc_class_t::u_rc_def_input,     &rsrc_class_t::u_rc_undef_input, &rsrc_class_t::u_rc_online_input,
+    &rsrc_class_t::u_rc_offline_input, &rsrc_class_t::u_rc_reset_input, &rsrc_class_t::u_rc_actionsC,
+    &rsrc_class_t::u_rc_actions,       &rsrc_class_t::u_rc_errors,      &rsrc_class_t::u_rc_depends,
+    &rsrc_class_t::u_rc_sd_defs,       &rsrc_class_t::u_rc_alias,       &rsrc_class_t::u_rc_name,
+};
+
+/* A class without a Name is called what the output file is called in front of ".cdef", directory and all. */
+void default_class_name(cdgen &cx) {
+    const char *suffix = strstr(cx.cdefname, ".cdef"); /* deliberately the first, and not only at the end */
+    if (suffix == nullptr)
+        cdgen_error_exit(cx, "Invalid cdef out file name (must end in .cdef)", nullptr, nullptr, 0, 1);
+    auto length = static_cast<size_t>(suffix - cx.cdefname);
+    std::unique_ptr<char, free_memory> name(static_cast<char *>(cfg_malloc(cx, length + 1)));
+    memcpy(name.get(), cx.cdefname, length);
+    tbl *strings = sc_tables[SC_RESOURCE_CLASS].sc_str_tbl(cx);
+    if (strings == nullptr)
+        source_error(cx, "No tbl for strings table");
+    cx.cb_rsrc_class.u_rc_name.offset[0] = add_to_tbl(cx, strings, name.get(), length + 1);
+}
+
+/* Deliberate: an attribute that a new class finds open goes into the old one as it is, unchecked. If it has no valid
+ * values its reference to them may still be 0, which is not "none": the reversal is told. */
+template <class Attribute>
+void flush_raw(cdgen &cx, Attribute &attr, cdb_ref_t rsrc_class_t::*records, vx_uint16_t found) {
+    if (attr.ra_cb_ID == 0)
+        return;
+    tbl *filed = staged_tbl(cx.cb_rsrc_class.*records);
+    if (!found && attr.u_ra_valid_vals.offset[0] == 0)
+        cx.strays.push_back({cx.rsrc_class_count, records, filed->used() + offsetof(Attribute, u_ra_valid_vals)});
+    if constexpr (std::is_same_v<Attribute, rsrc_dattr_t>)
+        note_stray_range(cx, attr, records);
+    append_record(cx, filed, attr);
+    attr.ra_cb_ID = 0;
+}
+
+} // namespace
+
+void init_cmmap_tbl(cdgen &cx) {
+    rsrc_cmmap_t &map = cx.cb_rsrc_cmmap;
+    if (map.rcm_cb_ID != 0)
+        cdgen_error_exit(cx, "Only one ClassToManagerMapping stanza allowed", nullptr, nullptr, 0, 1);
+    map = {};
+    map.rcm_cb_ID = CDB_ID_CMMAP;
+    stage_tbl(map.u_rcm_strings, make_tbl(cx, STRINGS_AU, "CMMapStrings"));
+}
+
+void cmplt_cmmap_tbl(cdgen &cx) {
+    rsrc_cmmap_t &map = cx.cb_rsrc_cmmap;
+    if (map.rcm_first_key > map.rcm_last_key)
+        source_error(cx, "Error: FirstKey is greater than LastKey.");
+    append_record(cx, &cx.rsrc_cmmap_tbl, map);
+    ++cx.rsrc_cmmap_count;
+    map.rcm_cb_ID = 0;
+}
+
+void init_mgr_tbl(cdgen &cx) {
+    rsrc_mgr_t &mgr = cx.cb_rsrc_mgr;
+    if (mgr.rm_cb_ID != 0)
+        cmplt_mgr_tbl(cx);
+    mgr = {};
+    mgr.rm_cb_ID = CDB_ID_MGR;
+    stage_tbl(mgr.u_rm_strings_table, make_tbl(cx, STRINGS_AU, "ManagerStrings"));
+}
+
+void cmplt_mgr_tbl(cdgen &cx) {
+    rsrc_mgr_t *staged = append_record(cx, &cx.rsrc_mgr_tbl, cx.cb_rsrc_mgr);
+    staged->rm_id = static_cast<vx_uint16_t>(cx.rsrc_mgr_count);
+    ++cx.rsrc_mgr_count;
+    cx.cb_rsrc_mgr.rm_cb_ID = 0;
+}
+
+void init_var_class_tbl(cdgen &cx) {
+    rsrc_variable_class_t &variable_class = cx.cb_rsrc_variable_class;
+    if (variable_class.rvc_cb_ID != 0)
+        cmplt_var_class_tbl(cx);
+    variable_class = {};
+    variable_class.rvc_cb_ID = CDB_ID_VARIABLE_CLASS;
+    mark_absent(variable_class.u_rvc_compat_name);
+    stage_tbl(variable_class.u_rvc_string_tbl, make_tbl(cx, STRINGS_AU, "VarClassStrings"));
+}
+
+void cmplt_var_class_tbl(cdgen &cx) {
+    file_tbl(cx, cx.cb_rsrc_variable_class.u_rvc_string_tbl);
+    append_record(cx, &cx.rsrc_var_class_tbl, cx.cb_rsrc_variable_class);
+    ++cx.rsrc_var_class_count;
+    cx.cb_rsrc_variable_class.rvc_cb_ID = 0;
+}
+
+void init_class_tbl(cdgen &cx) {
+    rsrc_class_t &rsrc_class = cx.cb_rsrc_class;
+    if (rsrc_class.rc_cb_ID != 0)
+        cmplt_class_tbl(cx);
+    rsrc_class = {};
+    rsrc_class.rc_cb_ID = CDB_ID_CLASS;
+    for (auto field : absent_at_open)
+        mark_absent(rsrc_class.*field);
+    for (const class_table &table : class_tables)
+        stage_tbl(rsrc_class.*table.field, make_tbl(cx, table.au, table.name));
+}
+
+/* ResourceClass goes on with the record that ControlDefinition opened. */
+void init_class_tbl_fake(cdgen &) {}
+
+void cmplt_class_tbl(cdgen &cx) {
+    rsrc_class_t &rsrc_class = cx.cb_rsrc_class;
+    if (rsrc_class.u_rc_name.offset[0] == CDB_NONE)
+        default_class_name(cx);
+    flush_raw(cx, cx.cb_rsrc_pattrC, &rsrc_class_t::u_rc_pattrsC, cx.pattrC_vv_found);
+    flush_raw(cx, cx.cb_rsrc_dattrC, &rsrc_class_t::u_rc_dattrsC, cx.dattrC_vv_found);
+    flush_raw(cx, cx.cb_rsrc_pattr, &rsrc_class_t::u_rc_pattrs, cx.pattr_vv_found);
+    flush_raw(cx, cx.cb_rsrc_dattr, &rsrc_class_t::u_rc_dattrs, cx.dattr_vv_found);
+    for (const class_table &table : class_tables)
+        file_tbl(cx, rsrc_class.*table.field);
+    append_record(cx, &cx.rsrc_class_tbl, rsrc_class);
+    ++cx.rsrc_class_count;
+    rsrc_class.rc_cb_ID = 0;
+}

@@ -1,0 +1,61 @@
+/* cdgen_process.cpp: how a process that is the compiler alone meets signals and the end of memory. */
+
+#include "compiler/cdgen.h"
+
+#include <atomic>
+#include <cerrno>
+#include <csignal>
+#include <cstdio>
+#include <exception>
+#include <unistd.h>
+
+namespace {
+
+constexpr int ending_signals[] = {SIGHUP, SIGINT, SIGQUIT, SIGTERM};
+
+/* Signals belong to the process and know of no context. */
+std::atomic<const char *> unfinished_output = nullptr;
+static_assert(decltype(unfinished_output)::is_always_lock_free, "handlers may only use what cannot be locked");
+
+/* The program still ends by the signal, as whoever sent it wants to see; it has been given back its meaning. */
+void remove_output(int signal) {
+    if (const char *name = unfinished_output.exchange(nullptr))
+        unlink(name);
+    raise(signal);
+}
+
+/* The file is another's now, and stays. */
+[[noreturn]] void report_cut_output(int) {
+    constexpr char message[] = "Cannot map CDB file: it was cut while it was written\n";
+    [[maybe_unused]] ssize_t written = write(STDERR_FILENO, message, sizeof message - 1);
+    _exit(1);
+}
+
+void handle(int signal, void (*handler)(int)) {
+    struct sigaction action = {}, before = {};
+    action.sa_handler = handler;
+    action.sa_flags = static_cast<int>(SA_RESETHAND);
+    if (sigaction(signal, &action, &before) == 0 && before.sa_handler == SIG_IGN)
+        sigaction(signal, &before, nullptr); /* as for what goes on when its terminal is closed */
+}
+
+/* What the standard library does where there is no memory even for an exception. */
+[[noreturn]] void end_without_memory() {
+    fprintf(stderr, "cfg_malloc malloc failure: %s\n", strerror(ENOMEM));
+    _exit(ENOMEM);
+}
+
+} // namespace
+
+void take_process() {
+    std::set_terminate(end_without_memory);
+    signal(SIGPIPE, SIG_IGN); /* a stream that nobody reads and a file that may not grow are errors of the call */
+    signal(SIGXFSZ, SIG_IGN);
+    for (int signal : ending_signals)
+        handle(signal, remove_output);
+    handle(SIGBUS, report_cut_output);
+}
+
+void set_unfinished_output(const char *name) {
+    unfinished_output = name;
+}

@@ -1,0 +1,274 @@
+/* cdgen_read.cpp: reads the source line by line, removes comments, and frames stanzas. */
+
+#include "compiler/cdgen_read.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <fcntl.h>
+#include <limits>
+#include <sys/stat.h>
+#include <unistd.h>
+
+namespace {
+
+constexpr size_t LINE_MAX_CHARS = 254; /* taken by one read, the newline included */
+
+/* What may end a line's text before its newline: quotes and comments, and the NUL behind the last byte. They are rare.
+ * Where the next one stands is found once, however many lines stand before it. */
+char *next_mark(char *from) {
+    return from + strcspn(from, "\"#/");
+}
+
+/* Moves a line's beginning to the front of the buffer and reads what follows; false at the end of the file. */
+bool refill(cdgen &cx) {
+    source_file &source = cx.cdb_fp;
+    size_t begun = source.end - source.pos;
+    memmove(source.buffer.data(), source.buffer.data() + source.pos, begun);
+    ssize_t n = 0;
+    do
+        n = read(source.fd, source.buffer.data() + begun, SOURCE_BUFFER - begun);
+    while (n < 0 && errno == EINTR);
+    if (n < 0) {
+        int error = errno;
+        cdgen_error_exit(cx, cx.cdefsrc, ": cannot read because: ", strerror(error), 0, error);
+    }
+    source.pos = 0;
+    source.end = begun + static_cast<size_t>(n);
+    source.buffer[source.end] = '\0';
+    source.mark = next_mark(source.buffer.data());
+    return n > 0;
+}
+
+source_line whole_line(source_file &source, char *begin, char *newline) {
+    source.pos += static_cast<size_t>(newline - begin) + 1;
+    if (source.mark < begin)
+        source.mark = next_mark(begin);
+    return {begin, newline, source.mark};
+}
+
+source_line cut_line(cdgen &cx, const char *begin, size_t length) {
+    cx.cdb_fp.pos += length;
+    memcpy(cx.inbuf, begin, length);
+    cx.inbuf[length] = '\0';
+    cx.cdb_fp.cut_mark = next_mark(cx.inbuf);
+    return {cx.inbuf, cx.inbuf + length, cx.cdb_fp.cut_mark};
+}
+
+source_line some_line(cdgen &cx) {
+    source_file &source = cx.cdb_fp;
+    for (;;) {
+        char *begin = source.buffer.data() + source.pos;
+        size_t there = std::min(LINE_MAX_CHARS, source.end - source.pos);
+        if (void *newline = memchr(begin, '\n', there))
+            return whole_line(source, begin, static_cast<char *>(newline));
+        if (there == LINE_MAX_CHARS || (!refill(cx) && there > 0))
+            return cut_line(cx, source.buffer.data() + source.pos, there);
+        if (source.end == 0)
+            return {nullptr, nullptr, source.mark};
+    }
+}
+
+bool is_blank(char c) {
+    return c == ' ' || c == '\t';
+}
+
+/* Where the text of a line that has marks ends: at its newline, its comment, or its NUL. Null for a line without text:
+ * blanks, quotes and comments are none. */
+char *end_by_marks(const source_line &line, char *p) {
+    bool text_seen = false;
+    bool quoted = false;
+    for (;; p = line.mark + 1, line.mark = next_mark(p)) {
+        char *mark = line.mark;
+        while (!text_seen && is_blank(*p))
+            ++p;
+        text_seen = text_seen || p < std::min(mark, line.end);
+        if (mark >= line.end)
+            return text_seen ? line.end : nullptr;
+        bool comment = *mark == '#' || (*mark == '/' && (mark[1] == '/' || mark[1] == '*'));
+        if (*mark == '\0' || (comment && !quoted) || (*mark == '#' && !text_seen))
+            return text_seen ? mark : nullptr;
+        quoted = quoted != (*mark == '"');
+        text_seen = text_seen || (*mark == '/' && !comment);
+    }
+}
+
+bool class_is_open(const cdgen &cx) {
+    return cx.cb_rsrc_class.rc_cb_ID != 0;
+}
+
+/* What refers to the SD section of a class or action run. An open class action goes before the resource action. */
+cdb_ref_t *owner_field(cdgen &cx, const sd_owner &owner) {
+    if (owner.of_class != nullptr)
+        return &(cx.cb_rsrc_class.*owner.of_class);
+    if (owner.of_action == nullptr)
+        return nullptr;
+    rsrc_action_t &action = cx.cb_rsrc_actionC.ac_cb_ID != 0 ? cx.cb_rsrc_actionC : cx.cb_rsrc_action;
+    return &(action.*owner.of_action);
+}
+
+/* The first stanza of a run makes the SD section and lets its owner refer to it. */
+void begin_sd_run(cdgen &cx, bool of_attribute) {
+    if (!of_attribute && !class_is_open(cx))
+        source_error(cx, "No class for SD Definition");
+    if (cx.curr_sd_tbl == nullptr)
+        cx.curr_sd_tbl = owner_field(cx, *cx.scp->sc_sd_owner);
+    if (cx.curr_sd_tbl != nullptr) {
+        cx.curr_sd_tbl->offset[0] = mk_sd_sec(cx);
+        cx.sd_num_elems = 0;
+    }
+    if (of_attribute && cx.attr_dflt_val == nullptr)
+        source_error(cx, "Incorrect attribute type preceding this SD definition");
+}
+
+stanza_state &state_of(cdgen &cx, const srtable_ctrl *scp) {
+    return cx.stanzas[static_cast<size_t>(scp - sc_tables.data())];
+}
+
+/* The values of the stanza before have been used. */
+void forget_values(cdgen &cx, dflt_tbl &dflt) {
+    if (dflt.tbl.use_count() == 1)
+        cx.spare_dflt = std::move(dflt.tbl);
+    dflt = {};
+}
+
+void begin_sd_stanza(cdgen &cx) {
+    bool of_attribute = is_attr_SD(cx.table_id) != nullptr;
+    stanza_state &state = state_of(cx, cx.scp);
+    if (cx.cb_sd_def.sd_cb_ID != 0 && cx.prev_scp != cx.scp) {
+        cmplt_sd_tbl(cx, cx.prev_scp);
+        if (!of_attribute)
+            cx.curr_sd_tbl = nullptr;
+    }
+    if (of_attribute && cx.attr_dflt_val != nullptr)
+        state.dflt = state_of(cx, cx.prev_scp).dflt;
+    if (!of_attribute) { /* an attribute that came before keeps what its own run gave it */
+        cx.attr_dflt_val = nullptr;
+        cx.max_sd_idx = nullptr;
+        if (cx.cb_sd_def.sd_cb_ID == 0)
+            cx.curr_sd_tbl = nullptr;
+    }
+    if (cx.cb_sd_def.sd_cb_ID == 0) {
+        begin_sd_run(cx, of_attribute);
+        if (!of_attribute)
+            forget_values(cx, state.dflt);
+    }
+    cx.scp->sc_init_tbl(cx);
+    state.req_mask = state.opt_mask = 0;
+}
+
+/* Attribute records stay open: their own kind's next stanza, or the end of input, completes them. */
+void begin_plain_stanza(cdgen &cx) {
+    if (cx.cb_sd_def.sd_cb_ID != 0)
+        cmplt_sd_tbl(cx, cx.prev_scp);
+    if (cx.cb_rsrc_action.ac_cb_ID != 0)
+        cmplt_action_tbl(cx);
+    if (cx.cb_rsrc_actionC.ac_cb_ID != 0)
+        cmplt_actionC_tbl(cx);
+    cx.scp->sc_init_tbl(cx);
+    forget_values(cx, cx.state->dflt);
+    cx.state->req_mask = cx.state->opt_mask = 0;
+    cx.attr_dflt_val = nullptr;
+    cx.curr_sd_tbl = nullptr;
+    cx.max_sd_idx = nullptr;
+}
+
+void begin_stanza(cdgen &cx, const char *name) {
+    cx.table_id = set_table_id(name);
+    if (cx.table_id < 0)
+        source_error(cx, "Invalid table name: ", name);
+    cx.prev_scp = cx.scp;
+    cx.scp = cx.curr_sd_scp = &sc_tables[static_cast<size_t>(cx.table_id)];
+    cx.state = &state_of(cx, cx.scp);
+    if (cx.scp->sc_sd_owner != nullptr)
+        begin_sd_stanza(cx);
+    else
+        begin_plain_stanza(cx);
+}
+
+} // namespace
+
+void source_file::close() {
+    if (fd >= 0)
+        ::close(fd);
+    fd = -1;
+}
+
+int above_stdio(int fd) {
+    if (fd < 0 || fd > STDERR_FILENO)
+        return fd;
+    int higher = fcntl(fd, F_DUPFD_CLOEXEC, STDERR_FILENO + 1);
+    int error = errno;
+    close(fd);
+    errno = error;
+    return higher;
+}
+
+void open_source(cdgen &cx, const char *filename) {
+    take_source(cx, filename, above_stdio(open(filename, O_RDONLY | O_CLOEXEC)));
+}
+
+void take_source(cdgen &cx, const char *filename, int fd) {
+    source_file &source = cx.cdb_fp;
+    source.fd = fd;
+    struct stat st = {};
+    if (source.fd < 0 || fstat(source.fd, &st) != 0)
+        cdgen_error_exit(cx, filename, ": cannot open because: ", strerror(errno), 0, errno);
+    source.device = st.st_dev;
+    source.inode = st.st_ino;
+    cx.table_id = -1;
+}
+
+source_line next_line(cdgen &cx) {
+    source_line line = some_line(cx);
+    if (line.begin != nullptr && cx.linenum < std::numeric_limits<int>::max())
+        ++cx.linenum;
+    return line;
+}
+
+attr_text text_of(const source_line &line) {
+    char *begin = line.begin;
+    while (is_blank(*begin))
+        ++begin;
+    char *end = line.mark < line.end ? end_by_marks(line, begin) : begin < line.end ? line.end : nullptr;
+    if (end == nullptr)
+        return {line.begin, begin, nullptr};
+    while (is_blank(end[-1]) || end[-1] == '#') /* there is text in front */
+        --end;
+    *end = '\0';
+    return {line.begin, begin, end};
+}
+
+void take_line(cdgen &cx, const attr_text &text) {
+    if (text.name == text.line)
+        begin_stanza(cx, text.name);
+    else if (cx.table_id < 0)
+        source_error(cx, "Attribute found but no table defined yet");
+    else
+        save_attr_line(cx, text, *cx.scp, *cx.state);
+}
+
+void cache_input_data(cdgen &cx, const char *filename) {
+    open_source(cx, filename);
+    for (;;) {
+        source_line line = next_line(cx);
+        if (line.begin == nullptr)
+            break;
+        attr_text text = text_of(line);
+        if (text.end != nullptr)
+            take_line(cx, text);
+    }
+    cx.cdb_fp.close();
+}
+
+const char *is_SD_stanza(int table_id) {
+    return strstr(sc_tables[static_cast<size_t>(table_id)].sc_name, "SDDefinition");
+}
+
+const char *is_attr_SD(int table_id) {
+    return strstr(sc_tables[static_cast<size_t>(table_id)].sc_name, "AttrSDDefinition");
+}
+
+sd_type_t SD_stanza_type(int table_id) {
+    const sd_owner *owner = sc_tables[static_cast<size_t>(table_id)].sc_sd_owner;
+    return owner == nullptr ? SD_TYPE_UNKNOWN : owner->type;
+}

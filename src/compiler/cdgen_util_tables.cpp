@@ -1,0 +1,235 @@
+/* cdgen_util_tables.cpp: staging tables and memory. */
+
+#include "compiler/cdgen.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <cmath>
+#include <cstdio>
+#include <cstdlib>
+#include <memory>
+#include <new>
+#include <utility>
+
+tbl::~tbl() {
+    free(tbl_base);
+    free(tbl_spare);
+}
+
+void tbl::restart(const char *name) {
+    if (tbl_base != nullptr)
+        tbl_spare = tbl_base;
+    tbl_base = tbl_prev_base = tbl_next = tbl_end = nullptr;
+    tbl_size = 0;
+    tbl_name = name;
+}
+
+void *cfg_malloc(cdgen &cx, size_t s) {
+    void *block = calloc(1, s);
+    if (block == nullptr)
+        cdgen_error_exit(cx, "cfg_malloc malloc failure: ", strerror(errno), nullptr, 0, errno);
+    return block;
+}
+
+tbl *make_tbl(cdgen &cx, size_t au, const char *name) {
+    if (cx.spare_tables.empty())
+        return &cx.tables.emplace_back(au, name);
+    tbl *spare = cx.spare_tables.back();
+    cx.spare_tables.pop_back();
+    std::destroy_at(spare);
+    return std::construct_at(spare, au, name);
+}
+
+namespace {
+
+/* The request rounded up to whole units. The quotient is deliberately formed in single precision, as it always was;
+ * where that loses integers, beyond 2^24 bytes, the chunk may come out short, and is then computed exactly. */
+size_t growth_chunk(const tbl &t, size_t s) {
+    if (s == 0)
+        return t.tbl_au;
+    float units = std::ceil(static_cast<float>(s) / static_cast<float>(t.tbl_au));
+    auto chunk = static_cast<size_t>(static_cast<double>(units) * static_cast<double>(t.tbl_au));
+    return chunk >= s ? chunk : (s + t.tbl_au - 1) / t.tbl_au * t.tbl_au;
+}
+
+/* Memory for the table's first or next bytes. Half as much again is asked for, so that a large table does not move at
+ * every unit; if that is not to be had, just what is needed. */
+char *larger_block(tbl &t, size_t needed) {
+    size_t generous = std::max(needed, t.tbl_capacity + t.tbl_capacity / 2);
+    for (size_t capacity : {generous, needed}) {
+        if (char *block = static_cast<char *>(realloc(t.tbl_base, capacity))) {
+            t.tbl_capacity = capacity;
+            return block;
+        }
+    }
+    return nullptr;
+}
+
+[[noreturn]] void table_failure(cdgen &cx, const tbl &t, const char *what) {
+    int error = errno;
+    cdgen_error_exit(cx, t.tbl_name, what, strerror(error), 0, error);
+}
+
+void first_block(cdgen &cx, tbl &t) {
+    char *block = t.tbl_spare != nullptr ? std::exchange(t.tbl_spare, nullptr) : larger_block(t, t.tbl_au);
+    if (block == nullptr)
+        table_failure(cx, t, ": alloc_tble malloc failure: ");
+    memset(block, 0, t.tbl_au);
+    t.tbl_base = t.tbl_prev_base = t.tbl_next = block;
+    t.tbl_size = t.tbl_au;
+    t.tbl_end = block + t.tbl_size;
+    if (cx.debugLevel > 2)
+        printf("alloc_tble: %s, table size: %d\n", t.tbl_name, static_cast<int>(t.tbl_size));
+}
+
+void grow(cdgen &cx, tbl &t, size_t s) {
+    size_t used = t.used();
+    size_t chunk = growth_chunk(t, s);
+    if (cx.debugLevel > 2)
+        fprintf(stderr, "alloc_tble: overflow by %d b. Adding %d b to %s\n", static_cast<int>(s),
+                static_cast<int>(chunk), t.tbl_name);
+    t.tbl_prev_base = t.tbl_base;
+    size_t size = t.tbl_size + chunk;
+    if (size > t.tbl_capacity) {
+        char *block = larger_block(t, size);
+        if (block == nullptr)
+            table_failure(cx, t, ": alloc_tble realloc failure: ");
+        t.tbl_base = block;
+        t.tbl_next = block + used;
+    }
+    t.tbl_size = size;
+    t.tbl_end = t.tbl_base + size;
+    memset(t.tbl_next, 0, size - used);
+    if (cx.debugLevel > 2)
+        printf("alloc_tble: %s, new table size: %d\n", t.tbl_name, static_cast<int>(t.tbl_size));
+}
+
+[[gnu::noinline]] void make_room(cdgen &cx, tbl &t, size_t s) {
+    if (cx.debugLevel > 2)
+        printf("alloc_tble: %s, structure size: %d\n", t.tbl_name, static_cast<int>(s));
+    if (t.tbl_base == nullptr)
+        first_block(cx, t);
+    if (s >= t.room())
+        grow(cx, t, s);
+}
+
+} // namespace
+
+void *alloc_tble(cdgen &cx, tbl *t, size_t s) {
+    if (s >= t->room() || cx.debugLevel > 2) /* reaching the end exactly grows too; without a block there is no room */
+        make_room(cx, *t, s);
+    char *reserved = t->tbl_next;
+    t->tbl_next += s;
+    return reserved;
+}
+
+void trim_tbl(tbl *t) {
+    size_t used = t == nullptr ? 0 : t->used();
+    if (used == 0)
+        return;
+    char *block = static_cast<char *>(realloc(t->tbl_base, used));
+    if (block == nullptr)
+        return;
+    t->tbl_base = block;
+    t->tbl_next = t->tbl_end = block + used;
+    t->tbl_size = t->tbl_capacity = used;
+}
+
+vx_uint32_t save_tbl_val_round(cdgen &cx, tbl *tp, const void *val, size_t len) {
+    auto *copy = static_cast<char *>(alloc_tble(cx, tp, round8(len)));
+    memcpy(copy, val, len);
+    return static_cast<vx_uint32_t>(copy - tp->tbl_base);
+}
+
+vx_uint32_t add_to_tbl(cdgen &cx, tbl *tp, const void *data, size_t len) {
+    return save_tbl_val_round(cx, tp, data, len);
+}
+
+void memcpy_8_rounded(char *dst, const char *src, int len) {
+    int rounded = (len + 7) & ~7;
+    memcpy(dst, src, static_cast<size_t>(len));
+    if (rounded > len)
+        memset(dst + len, 0, static_cast<size_t>(rounded - len));
+}
+
+void *tbl_at(cdgen &cx, tbl_content *t, size_t offset, size_t size) {
+    if (t->tbl_base == nullptr || offset > t->used() || size > t->used() - offset)
+        cdgen_error_exit(cx, t->tbl_name, ": reference outside the table - internal error", nullptr, 0, 1);
+    return t->tbl_base + offset;
+}
+
+/* A pool grows by chunks that hold several lines' values, each twice as large as the one before; the latest serves
+ * again after clear(). */
+struct text_pool::chunk {
+    chunk *next;
+    size_t size; /* bytes that follow */
+
+    char *bytes() {
+        return reinterpret_cast<char *>(this + 1);
+    }
+};
+
+namespace {
+constexpr size_t POOL_CHUNK = 1024;
+} // namespace
+
+text_pool::~text_pool() {
+    while (head != nullptr)
+        free(std::exchange(head, head->next));
+}
+
+char *text_pool::take(size_t n) {
+    n = round8(n);
+    if (head == nullptr || n > left) {
+        size_t size = std::max(n, head == nullptr ? POOL_CHUNK : 2 * head->size);
+        auto *fresh = static_cast<chunk *>(malloc(sizeof(chunk) + size));
+        if (fresh == nullptr)
+            return nullptr;
+        *fresh = {head, size};
+        head = fresh;
+        left = size;
+    }
+    char *taken = head->bytes() + (head->size - left);
+    left -= n;
+    memset(taken, 0, n);
+    return taken;
+}
+
+void text_pool::clear() {
+    if (head == nullptr)
+        return;
+    while (head->next != nullptr)
+        free(std::exchange(head->next, head->next->next));
+    left = head->size;
+}
+
+namespace {
+
+constexpr size_t SMALL = 256; /* bytes: a block for as little would take half as much again */
+
+tbl_content *keep_copy(cdgen &cx, const tbl &t) {
+    char *content = cx.filed_small.take(sizeof(tbl_content) + t.used());
+    if (content == nullptr)
+        table_failure(cx, t, ": alloc_tble malloc failure: ");
+    char *bytes = content + sizeof(tbl_content);
+    memcpy(bytes, t.tbl_base, t.used());
+    return new (content) tbl_content{bytes, bytes + t.used(), t.tbl_name};
+}
+
+tbl_content *keep_block(cdgen &cx, tbl &t) {
+    trim_tbl(&t);
+    tbl_content *kept = &cx.filed.emplace_back(t);
+    t.tbl_base = t.tbl_next = nullptr;
+    return kept;
+}
+
+} // namespace
+
+void file_tbl(cdgen &cx, cdb_ref_t &ref) {
+    tbl *open = staged_tbl(ref);
+    if (open->used() == 0)
+        stage_tbl(ref, nullptr);
+    else
+        stage_tbl(ref, open->used() <= SMALL ? keep_copy(cx, *open) : keep_block(cx, *open));
+    cx.spare_tables.push_back(open);
+}

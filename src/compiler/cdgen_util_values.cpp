@@ -1,0 +1,367 @@
+/* cdgen_util_values.cpp: data types by name, and from text to values. */
+
+#include "compiler/cdgen.h"
+
+#include <cerrno>
+#include <cfloat>
+#include <cstdlib>
+#include <limits>
+#include <string_view>
+
+namespace {
+
+constexpr name_index type_names(std::size(vxTypeStr), [](size_t i) { return std::string_view(vxTypeStr[i]); });
+
+/* A call into the C library's conversions with errno as they alone know it. */
+template <class Convert> auto converted(cdgen &cx, Convert convert) {
+    int outside = errno;
+    errno = cx.conv_errno;
+    auto value = convert();
+    cx.conv_errno = errno;
+    errno = outside;
+    return value;
+}
+
+bool conversion_failed(const cdgen &cx) {
+    return cx.conv_errno == ERANGE || cx.conv_errno == EINVAL;
+}
+
+/* More than 9 for what is no decimal digit. */
+unsigned digit_of(char c) {
+    return static_cast<unsigned>(c) - '0';
+}
+
+/* Plain decimal text of at most 18 digits, which is most of what is written: the C library's result, without it. Null
+ * where its rules are wanted. */
+const char *plain_decimal(const char *text, vx_uint64_t *value) {
+    constexpr int SAFE_DIGITS = 18;
+    const char *p = text;
+    vx_uint64_t n = 0;
+    for (unsigned digit = 0; (digit = digit_of(*p)) <= 9; ++p)
+        n = n * 10 + digit;
+    if (p == text || p - text > SAFE_DIGITS)
+        return nullptr;
+    *value = n;
+    return p;
+}
+
+/* The same with a minus sign in front, or without. */
+const char *plain_signed(const char *text, vx_int64_t *value) {
+    bool negative = *text == '-';
+    vx_uint64_t n = 0;
+    const char *end = plain_decimal(text + negative, &n);
+    *value = negative ? -static_cast<vx_int64_t>(n) : static_cast<vx_int64_t>(n);
+    return end;
+}
+
+/* Digits with or without a fraction, such that they as an integer and the power of ten are exact: the one division
+ * rounds as the C library does. False where its rules are wanted. */
+template <class Float> bool plain_fraction(const char *text, Float *value) {
+    constexpr vx_uint64_t EXACT = vx_uint64_t{1} << std::numeric_limits<Float>::digits;
+    constexpr int EXACT_POWER = sizeof(Float) == sizeof(float) ? 10 : 18; /* of ten; and no overflow of n */
+    bool negative = *text == '-';
+    vx_uint64_t n = 0;
+    const char *p = plain_decimal(text + negative, &n);
+    if (p == nullptr)
+        return false;
+    auto digits = p - text - negative;
+    Float scale = 1;
+    if (*p == '.')
+        for (unsigned digit = 0; (digit = digit_of(*++p)) <= 9; ++digits, scale *= 10)
+            n = n * 10 + digit;
+    Float size = static_cast<Float>(n) / scale;
+    *value = negative ? -size : size;
+    bool rounded_once = FLT_EVAL_METHOD == 0 || FLT_EVAL_METHOD == 1;
+    return rounded_once && *p == '\0' && n <= EXACT && digits <= EXACT_POWER;
+}
+
+[[gnu::noinline]] long library_integer(cdgen &cx, const char *text, char **end, int base) {
+    return converted(cx, [&] { return strtol(text, end, base); });
+}
+
+/* The whole text as a decimal integer: false when anything else follows. */
+bool whole_signed(cdgen &cx, const char *text, vx_int64_t *value) {
+    if (const char *end = plain_signed(text, value))
+        return *end == '\0';
+    char *end = nullptr;
+    *value = converted(cx, [&] { return strtoll(text, &end, 10); });
+    return *end == '\0';
+}
+
+bool whole_unsigned(cdgen &cx, const char *text, vx_uint64_t *value) {
+    if (const char *end = plain_decimal(text, value))
+        return *end == '\0';
+    char *end = nullptr;
+    *value = converted(cx, [&] { return strtoull(text, &end, 10); });
+    return *end == '\0';
+}
+
+template <class Float>
+bool whole_float(cdgen &cx, const char *text, Float *value, Float (*convert)(const char *, char **)) {
+    if (plain_fraction(text, value))
+        return true;
+    char *end = nullptr;
+    *value = converted(cx, [&] { return convert(text, &end); });
+    return *end == '\0';
+}
+
+/* A value that the library also returns for text it cannot convert is refused while errno says that it could not. Which
+ * may be because of an earlier text: deliberately, nothing clears it. */
+template <class Integer> bool suspicious(Integer value) {
+    using limits = std::numeric_limits<Integer>;
+    return value == 0 || value == limits::max() || (limits::is_signed && value == limits::min());
+}
+
+/* Deliberately not symmetric: NaN and negative infinity are taken. */
+template <class Float> bool suspicious_float(Float value) {
+    using limits = std::numeric_limits<Float>;
+    return value == 0 || value >= limits::max() || value == limits::min();
+}
+
+int int32_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
+    vx_int64_t wide = 0;
+    if (!whole_signed(cx, text, &wide))
+        return -1;
+    auto value = static_cast<vx_int32_t>(wide); /* silently narrowed */
+    if (suspicious(value) && conversion_failed(cx))
+        return -1;
+    out->val_int32 = value;
+    return 0;
+}
+
+int uint32_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
+    vx_uint64_t wide = 0;
+    if (!whole_unsigned(cx, text, &wide))
+        return -1;
+    auto value = static_cast<vx_uint32_t>(wide); /* silently narrowed */
+    if (suspicious(value) && conversion_failed(cx))
+        return -1;
+    out->val_uint32 = value;
+    return 0;
+}
+
+int int64_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
+    vx_int64_t value = 0;
+    if (!whole_signed(cx, text, &value) || (suspicious(value) && conversion_failed(cx)))
+        return -1;
+    out->val_int64 = value;
+    return 0;
+}
+
+int uint64_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
+    vx_uint64_t value = 0;
+    if (!whole_unsigned(cx, text, &value) || (suspicious(value) && conversion_failed(cx)))
+        return -1;
+    out->val_uint64 = value;
+    return 0;
+}
+
+int float32_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
+    float value = 0;
+    if (!whole_float(cx, text, &value, strtof) || (suspicious_float(value) && conversion_failed(cx)))
+        return -1;
+    out->val_float32 = value;
+    return 0;
+}
+
+int float64_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
+    double value = 0;
+    if (!whole_float(cx, text, &value, strtod) || (suspicious_float(value) && conversion_failed(cx)))
+        return -1;
+    out->val_float64 = value;
+    return 0;
+}
+
+int string_from_text(cdgen &, vx_value_t *out, const char *text, text_pool &pool) {
+    size_t size = strlen(text) + 1;
+    char *copy = pool.take(size);
+    if (copy == nullptr)
+        return -1;
+    memcpy(copy, text, size);
+    out->ptr_char = copy;
+    return 0;
+}
+
+/* Text that starts with 0 is hexadecimal and must have an x next; any other has escapes. The block is zeroed and large
+ * enough for the bytes that a reader of the block takes from behind the escapes' decoded text. */
+int binary_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &pool) {
+    char *block = pool.take(sizeof(vx_uint32_t) + strlen(text) + sizeof(vx_uint32_t));
+    if (block == nullptr)
+        return -1;
+    out->ptr_binary = reinterpret_cast<vx_binary_t *>(block);
+    return text[0] == '0' ? hex_convert(block, text) : oct_convert(cx, text, 2, block);
+}
+
+using converter = int (*)(cdgen &, vx_value_t *, const char *, text_pool &);
+
+/* By type, VX_INT32 to VX_BINARY_PTR. */
+constexpr converter converters[] = {int32_from_text,   uint32_from_text,  int64_from_text,  uint64_from_text,
+                                    float32_from_text, float64_from_text, string_from_text, binary_from_text};
+
+/* 0 to 15, or -1. */
+int hex_digit(char c) {
+    if (c >= '0' && c <= '9')
+        return c - '0';
+    if (c >= 'a' && c <= 'f')
+        return c - 'a' + 10;
+    if (c >= 'A' && c <= 'F')
+        return c - 'A' + 10;
+    return -1;
+}
+
+/* The number after a backslash, of at most three characters, which *p is moved over. -1 if there is none. Blanks and a
+ * sign count as characters of it. */
+long octal_escape(cdgen &cx, const char **p) {
+    char digits[4] = {};
+    strncpy(digits, *p, 3);
+    char *end = nullptr;
+    long value = int_from_text(cx, digits, &end, 8);
+    *p += end - digits;
+    return end == digits ? 256 : value;
+}
+
+void store_length(char *block, size_t length) {
+    auto count = static_cast<vx_uint32_t>(length);
+    memcpy(block, &count, sizeof count);
+}
+
+} // namespace
+
+vx_data_type_t strToVxDt(const char *s) {
+    int at = s == nullptr ? -1 : type_names.candidate(s);
+    return at >= 0 && strcmp(s, vxTypeStr[at]) == 0 ? vxTypeMap[at] : VX_UNKNOWN;
+}
+
+int strToVar(const char *s, orb_variable_type_t *t) {
+    if (s != nullptr)
+        for (size_t i = 0; i < std::size(vxVarStr); ++i)
+            if (strcmp(s, vxVarStr[i]) == 0) {
+                *t = vxVarMap[i];
+                return 0;
+            }
+    return 1;
+}
+
+vx_data_type_t scalar_vx(vx_data_type_t dt) {
+    return is_vx_array(dt) ? static_cast<vx_data_type_t>(dt - VX_INT32_ARRAY + VX_INT32) : dt;
+}
+
+int is_vx_array(vx_data_type_t dt) {
+    return static_cast<unsigned>(dt) - VX_INT32_ARRAY < 10;
+}
+
+long int_from_text(cdgen &cx, const char *text, char **end, int base) {
+    vx_uint64_t plain = 0;
+    bool decimal = base == 10 || (base == 0 && (text[0] != '0' || text[1] == '\0'));
+    const char *after = decimal ? plain_decimal(text, &plain) : nullptr;
+    if (after == nullptr)
+        return library_integer(cx, text, end, base);
+    if (end != nullptr)
+        *end = const_cast<char *>(after);
+    return static_cast<long>(plain);
+}
+
+int str_to_vx(cdgen &cx, vx_value_t *vx_out, vx_data_type_t vx_type, const char *str_in, text_pool &pool) {
+    vx_data_type_t scalar = scalar_vx(vx_type);
+    if (str_in[0] == '\0' || scalar < VX_INT32 || scalar > VX_BINARY_PTR)
+        return -1;
+    return converters[scalar - VX_INT32](cx, vx_out, str_in, pool);
+}
+
+int hex_convert(char *vx_out, const char *str_in) {
+    size_t len = strlen(str_in);
+    if (str_in[0] != '0' || str_in[1] != 'x' || len % 2 != 0)
+        return -1;
+    char *data = vx_out + sizeof(vx_uint32_t);
+    for (const char *p = str_in + 2; *p != '\0'; p += 2) {
+        int high = hex_digit(p[0]);
+        int low = hex_digit(p[1]);
+        if (high < 0 || low < 0)
+            return -1;
+        *data++ = static_cast<char>(high * 16 + low);
+    }
+    store_length(vx_out, (len - 2) / 2);
+    return 0;
+}
+
+int oct_convert(cdgen &cx, const char *p, int type, char *out_buf) {
+    char *out = out_buf;
+    while (*p != '\0') {
+        if (*p != '\\') {
+            *out++ = *p++;
+        } else if (p[1] == '\\') {
+            *out++ = '\\';
+            p += 2;
+        } else {
+            ++p;
+            long value = octal_escape(cx, &p);
+            if (value > 255)
+                return -1;
+            *out++ = static_cast<char>(value);
+        }
+    }
+    if (type == 1)
+        *out = '\0';
+    else /* deliberately over the first four bytes: the data that follow begin with the fifth */
+        store_length(out_buf, static_cast<size_t>(out - out_buf));
+    return 0;
+}
+
+char *strip_quotes(char *s) {
+    if (s == nullptr)
+        return nullptr;
+    char *end = s + strlen(s);
+    return strip_quotes(s, &end);
+}
+
+char *strip_quotes(char *s, char **end) {
+    char *open = s;
+    while (*open == ' ' || *open == '\t')
+        ++open;
+    if (*open != '"')
+        return s;
+    char *close = *end - 1;
+    if (*close != '"' || (close > s && close[-1] == '\\'))
+        return nullptr;
+    *close = '\0';
+    *end = close;
+    return open == close ? open : open + 1;
+}
+
+void set_props(cdgen &cx, vx_uint32_t *dest, const props_t *props, int len, char *vnoq) {
+    for (char *rest = vnoq; rest != nullptr;) {
+        char *name = rest;
+        rest = getNextArrVal(rest);
+        if (*name == '\0') /* an empty field */
+            continue;
+        const props_t *known = props;
+        while (known < props + len && (known->s[0] != name[0] || strcmp(known->s, name) != 0))
+            ++known;
+        if (known == props + len)
+            cdgen_error_exit(cx, name, ": invalid property", nullptr, 0, 1);
+        *dest |= known->p;
+    }
+}
+
+int ver_str_convert(cdgen &cx, const char *ver_str, vx_uint32_t *n) {
+    vx_uint32_t component[4] = {};
+    const char *p = ver_str;
+    for (vx_uint32_t &value : component) {
+        value = static_cast<vx_uint32_t>(converted(cx, [&] { return strtoul(p, nullptr, 10); }));
+        p = strchr(p, '.');
+        if (p == nullptr)
+            break;
+        ++p;
+    }
+    /* The last one is deliberately not masked. */
+    *n = component[0] << 24 | (component[1] & 255) << 16 | (component[2] & 255) << 8 | component[3];
+    return 0;
+}
+
+char *getNextArrVal(char *line) {
+    char *comma = line == nullptr ? nullptr : strchr(line, ',');
+    if (comma == nullptr)
+        return nullptr;
+    *comma = '\0';
+    return comma + 1;
+}

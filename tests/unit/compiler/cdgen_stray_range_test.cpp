@@ -1,0 +1,78 @@
+/* A range of a class attribute that landed in a resource attribute of another type is a number where a reference would
+ * be. Reversing the database must not follow it, wherever it seems to lead. */
+
+#include "compiler/cdgen.h"
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <fstream>
+#include <string>
+#include <unistd.h>
+
+namespace {
+
+const std::string HEAD = "ControlDefinition\n\tFileVersion=1.0.0.0\n"
+                         "ResourceClass\n\tDescription=1\n\tDisplayName=2\n\tProperties=CanDefine\n"
+                         "\tClassPermTemplate=0\n\tResourcePermTemplate=0\n\tName=ABCDEFGHIJKLMNOPQRSTUVWXYZ\n";
+const std::string TAIL = "ClassToManagerMapping\n\tResourceManager=M\n\tFirstKey=1\n\tLastKey=2\n"
+                         "\tMessageCatalog=m.cat\n\tDescriptiveMessageSet=1\n";
+
+std::string attribute(const std::string &stanza, const std::string &type, const std::string &rest) {
+    return stanza + "\n\tName=" + stanza + "\n\tDescription=1\n\tDisplayName=2\n\tId=3\n\tDataType=" + type +
+           "\n\tVariableType=State\n\tVarietyRange=1,1\n" + rest;
+}
+
+size_t count_of(const std::string &all, const std::string &text) {
+    size_t count = 0;
+    for (size_t at = all.find(text); at != std::string::npos; at = all.find(text, at + 1))
+        ++count;
+    return count;
+}
+
+class StrayRange : public testing::TestWithParam<const char *> {
+protected:
+    void SetUp() override {
+        directory = std::filesystem::temp_directory_path() / ("cdgen-stray-" + std::to_string(getpid()));
+        std::filesystem::create_directory(directory);
+        setenv("VX_CDB_FORCE_EMPTY_TIMESTAMP", "", 1);
+    }
+    void TearDown() override {
+        std::filesystem::remove_all(directory);
+    }
+
+    std::string compiled(const std::string &source, std::string options) {
+        std::string in = directory / "in.cdefsrc", out = directory / "out.cdef", program = "cdgen";
+        std::ofstream(in) << source;
+        char *argv[] = {program.data(), options.data(), in.data(), out.data(), nullptr};
+        EXPECT_EQ(cdgen_main(4, argv), 0);
+        std::ifstream image(out, std::ios::binary);
+        return {std::istreambuf_iterator<char>(image), {}};
+    }
+
+    std::filesystem::path directory;
+};
+
+/* The class's name is the first string; 8 and 16 lead into it, and as a binary's length would turn "IJKL" to "LKJI". */
+TEST_P(StrayRange, DoesNotTurnText) {
+    std::string source = HEAD + attribute("DynamicResourceAttribute", GetParam(), "") +
+                         attribute("DynamicClassAttribute", "Int32", "\tRange=8,16\n");
+    bool is_binary = GetParam() == std::string("Binary");
+    for (size_t classes : {1, 2}) {    /* completed, and cut short by another class */
+        if (is_binary && classes == 1) /* whose completion leaves it without bounds */
+            continue;
+        std::string whole = source + (classes == 2 ? HEAD : "") + TAIL;
+        std::string native = compiled(whole, "-n"), turned = compiled(whole, "-s");
+        EXPECT_EQ(count_of(native, "ABCDEFGHIJKLMNOPQRSTUVWXYZ"), classes);
+        EXPECT_EQ(count_of(turned, "ABCDEFGHIJKLMNOPQRSTUVWXYZ"), classes);
+        size_t ra_min_value = 80 + 16 * (classes + 2) + sizeof(rsrc_class_t) + sizeof(rsrc_dattr_t) + 40;
+        std::string word = native.substr(ra_min_value, 4);
+        EXPECT_EQ(word[0] + word[3], 8); /* in either order */
+        EXPECT_EQ(turned.substr(ra_min_value, 4), std::string(word.rbegin(), word.rend()));
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(Types, StrayRange,
+                         testing::Values("Binary", "StringArray", "BinaryArray", "SDArray", "RHArray"));
+
+} // namespace

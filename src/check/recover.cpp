@@ -40,13 +40,25 @@ void close_run(cdgen &cx) {
     cx.expected_sdeli = 0;
 }
 
-constexpr vx_uint32_t bit_of(int attr_type) {
-    return 1u << attr_type;
+constexpr vx_uint32_t bit_of(int kind) {
+    return 1u << kind;
 }
 
 constexpr vx_uint32_t EVERY_KIND = bit_of(SC_COUNT) - 1;
-constexpr vx_uint32_t VALID_VALUES = bit_of(AT_VALID_VALUE) | bit_of(AT_SD_VALID_VALUE);
-constexpr vx_uint32_t TYPED = VALID_VALUES | bit_of(AT_DEFAULT_VALUE) | bit_of(AT_INITIAL_VALUE) | bit_of(AT_RANGE);
+
+/* Whether an attribute's text is converted as the stanza's data type says. */
+bool is_typed(int attr_type) {
+    switch (attr_type) {
+    case AT_VALID_VALUE:
+    case AT_SD_VALID_VALUE:
+    case AT_DEFAULT_VALUE:
+    case AT_INITIAL_VALUE:
+    case AT_RANGE:
+        return true;
+    default:
+        return false;
+    }
+}
 
 bool is_message(const message &known, const char *code) {
     return std::string_view(known.code) == code;
@@ -174,7 +186,7 @@ void session::open_stanza(int new_kind, bool broken) {
     cx.stanzas[index_of(kind)].broken = broken;
     stanza_note &stanza = stanzas[index_of(kind)];
     stanza.given.fill(0);
-    stanza.failed = 0;
+    stanza.refused = {};
     stanza.misplaced = false;
     stanza.data_type.at = {};
     stanza.header = all_of_line();
@@ -317,7 +329,7 @@ void session::take_quietly(std::string_view text) {
         note_given();
     } catch (const fatal_exit &) {
         cx.state->broken = true;
-        stanzas[index_of(kind)].failed |= cx.latest.attr == nullptr ? LOST_NAME : bit_of(cx.latest.attr->ta_type);
+        note_refused(cx.latest.attr == nullptr ? std::nullopt : std::optional(cx.latest.attr->ta_type));
     }
 }
 
@@ -359,20 +371,29 @@ std::string_view session::name_given() const {
     return std::string_view(raw).substr(at.column - 1, at.length);
 }
 
-/* What a line that could not be read seems to have been. */
-vx_uint32_t session::type_meant() const {
+/* The attribute type of a line that could not be read; nothing if its name is like none of the kind's. */
+std::optional<int> session::type_meant() const {
     std::string_view name = name_given();
     const table_attrs *attr = find_attr(*cx.scp, name);
     if (std::string_view meant = near_miss(name, attribute_names(*cx.scp)); attr == nullptr && !meant.empty())
         attr = find_attr(*cx.scp, meant);
-    return attr == nullptr ? LOST_NAME : bit_of(attr->ta_type);
+    return attr == nullptr ? std::nullopt : std::optional(attr->ta_type);
+}
+
+/* Nothing stands for an attribute whose name is not known. */
+void session::note_refused(std::optional<int> type) {
+    refused_attributes &refused = stanzas[index_of(kind)].refused;
+    if (type)
+        refused.types.set(index_of(*type));
+    else
+        refused.unknown_name = true;
 }
 
 /* Whether a line belongs to another stanza, as one before it did. Notes it if it is the first: a second name, or an
  * attribute that other kinds have and this one has not. */
 bool session::misplaced(const fatal_exit &failure) {
     const message &known = message_of(failure);
-    bool unknown = is_message(known, "S106") && (type_meant() & LOST_NAME) != 0;
+    bool unknown = is_message(known, "S106") && !type_meant();
     bool repeated = is_message(known, "S109");
     bool &before = stanzas[index_of(kind)].misplaced;
     if (before)
@@ -415,11 +436,12 @@ bool session::attribute_follows(const fatal_exit &failure) {
     if (is_message(known, "S117"))
         return told_otherwise(failure);
     const stanza_note &stanza = stanzas[index_of(kind)];
-    bool typed = cx.latest.attr != nullptr && (bit_of(cx.latest.attr->ta_type) & TYPED) != 0;
+    bool typed = cx.latest.attr != nullptr && is_typed(cx.latest.attr->ta_type);
     bool untyped = cx.state->broken && cx.scp->dt_offset >= 0 && data_type(cx) == VX_UNKNOWN;
     if (typed && untyped && is_message(known, "S207"))
         return true;
-    if (is_message(known, "S208") && (stanza.failed & (VALID_VALUES | LOST_NAME)) != 0)
+    bool value_refused = stanza.refused.has_any({AT_VALID_VALUE, AT_SD_VALID_VALUE}) || stanza.refused.unknown_name;
+    if (is_message(known, "S208") && value_refused)
         return true;
     return misplaced(failure);
 }
@@ -467,11 +489,10 @@ void session::recover_attribute(const fatal_exit &failure) {
     overflow_told = false;
     recover_value(failure, follows);
     cx.state->broken = true;
-    stanza_note &stanza = stanzas[index_of(kind)];
     if (is_message(known, "S108"))
         take_quietly(std::string_view(raw).substr(0, all_of_line().column - 1 + all_of_line().length));
     else
-        stanza.failed |= cx.latest.attr == nullptr ? type_meant() : bit_of(cx.latest.attr->ta_type);
+        note_refused(cx.latest.attr == nullptr ? type_meant() : std::optional(cx.latest.attr->ta_type));
     cx.conv_errno = 0; /* its mark would be a second report of the same number */
 }
 

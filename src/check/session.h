@@ -4,14 +4,26 @@
 
 #include "check/check.h"
 
+#include <algorithm>
+#include <bitset>
 #include <functional>
+#include <initializer_list>
 #include <optional>
 
 namespace cdef::check {
 
-constexpr size_t ATTRS_MAX = 32;            /* attributes of one kind */
-constexpr vx_uint32_t ELEMENT_INDEX = 0x8;  /* in an SD kind's req_mask */
-constexpr vx_uint32_t LOST_NAME = 1u << 31; /* in failed: an attribute whose name is not known */
+constexpr size_t ATTRS_MAX = 32;           /* attributes of one kind */
+constexpr vx_uint32_t ELEMENT_INDEX = 0x8; /* in an SD kind's req_mask */
+
+/* Attributes of a stanza whose lines were refused. */
+struct refused_attributes {
+    bool has_any(std::initializer_list<attr_type> wanted) const {
+        return std::any_of(wanted.begin(), wanted.end(), [this](attr_type type) { return types.test(type); });
+    }
+
+    std::bitset<AT_COUNT> types;
+    bool unknown_name = false; /* one of them has a name that the kind does not know */
+};
 
 /* A name or a number at a place of the source. */
 struct mention {
@@ -24,10 +36,10 @@ struct mention {
 struct stanza_note {
     place header;
     std::array<int, ATTRS_MAX> given = {}; /* line of each attribute, by its position in the kind; 0: none */
-    vx_uint32_t failed = 0;                /* bits by attr_type, of attributes whose value was refused */
-    mention data_type;                     /* the value of its DataType */
-    bool misplaced = false;                /* lines of another stanza seem to be in it */
-    std::string source;                    /* the header's line */
+    refused_attributes refused;
+    mention data_type;      /* the value of its DataType */
+    bool misplaced = false; /* lines of another stanza seem to be in it */
+    std::string source;     /* the header's line */
 };
 
 /* A Range that has not yet been settled with its attribute. */
@@ -119,7 +131,8 @@ struct session {
     void note_given();
     bool lost_index(int new_kind) const;
     std::string_view name_given() const;
-    vx_uint32_t type_meant() const;
+    std::optional<int> type_meant() const;
+    void note_refused(std::optional<int> type);
     bool misplaced(const fatal_exit &failure);
     void take_attribute(const attr_text &text);
     bool recover_header(const fatal_exit &failure, int kind);

@@ -4,6 +4,7 @@
 #define CDGEN_CDEF_CHECK_H
 
 #include "compiler/cdgen_read.h"
+#include "language/suggestions.h"
 
 #include <array>
 #include <span>
@@ -107,13 +108,11 @@ result check_source(const std::string &path, const warning_set &wanted);
 
 /* ---- Names (names.cpp) ----------------------------------------------------------------------------- */
 
-using name_list = std::vector<std::string_view>;
-
-/* The only one of the names that the text may have been meant to be; empty if there is none or there are several. */
-std::string_view near_miss(std::string_view text, const name_list &names);
-
-/* "did you mean `Name`?", or else "known are `Name` and `Id`", unless they are too many. */
-std::string suggestion(std::string_view text, const name_list &names);
+using language::listed;
+using language::name_list;
+using language::near_miss;
+using language::quoted;
+using language::suggestion;
 
 name_list stanza_names();
 name_list attribute_names(const srtable_ctrl &kind);
@@ -121,23 +120,10 @@ name_list attribute_names(const srtable_ctrl &kind);
 /* The stanza kinds that have an attribute of this name, as bits. */
 vx_uint32_t kinds_with(std::string_view name);
 
-/* The data types that an attribute, or an element, can be of. */
-name_list data_type_names(bool element);
-
-/* As suggestion() says it; but what is near a type that is refused is told so. */
-std::string type_suggestion(std::string_view text, bool element);
-
-name_list variable_type_names();
 name_list property_names(int attr_type);
 
 /* The required attributes of a kind that a mask lacks. */
 name_list missing_names(const srtable_ctrl &kind, vx_uint32_t mask);
-
-/* "`Name`" */
-std::string quoted(std::string_view text);
-
-/* "`Name`, `Id` and `DataType`" */
-std::string listed(const name_list &names);
 
 /* ---- Forms (report/text.cpp, report/json.cpp) -------------------------------------------------------------
  */

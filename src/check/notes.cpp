@@ -124,11 +124,11 @@ void unknown_property(noting &n) {
 }
 
 void unknown_type(noting &n) {
-    n.add(n.found.at, type_suggestion(n.marked(), false));
+    n.add(n.found.at, language::type_suggestion(n.marked(), false));
 }
 
 void unknown_variable_type(noting &n) {
-    n.add(n.found.at, suggestion(n.marked(), variable_type_names()));
+    n.add(n.found.at, suggestion(n.marked(), language::variable_type_names()));
 }
 
 void overflowed(noting &n) {
@@ -144,7 +144,8 @@ void bad_value(noting &n) {
     if (numeric && check.overflow_line != 0)
         overflowed(n);
     else if (type == VX_UNKNOWN)
-        n.add(n.stanza().data_type.at, "unknown data type: " + type_suggestion(n.stanza().data_type.text, true));
+        n.add(n.stanza().data_type.at,
+              "unknown data type: " + language::type_suggestion(n.stanza().data_type.text, true));
     else
         n.add(n.found.at, quoted(vxTypeStr[type]) + " takes " + form_of(type));
 }
@@ -166,7 +167,7 @@ void bad_default(noting &n) {
         n.show(n.stanza().data_type, "the DataType of this " + quoted(n.table().sc_name));
     else
         for (const mention &odd : n.check.odd_elements)
-            n.show(odd, odd.text == "SBS" ? "the element's DataType" : type_suggestion(odd.text, true));
+            n.show(odd, odd.text == "SBS" ? "the element's DataType" : language::type_suggestion(odd.text, true));
 }
 
 void no_manager(noting &n) {

@@ -165,7 +165,7 @@ void session::watch_element_type(std::string_view text, const place &at) {
     if (cx.attr_dflt_val != nullptr && (unknown || text == "SBS"))
         odd_elements.push_back({at, std::string(text), raw});
     else if (unknown)
-        warn(ELEMENT_TYPE, at, "unknown data type: the element gets none", {at, type_suggestion(text, true)});
+        warn(ELEMENT_TYPE, at, "unknown data type: the element gets none", {at, language::type_suggestion(text, true)});
 }
 
 void session::watch_attribute() {

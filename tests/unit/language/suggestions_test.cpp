@@ -1,0 +1,67 @@
+/* Suggestions for misspelt names. */
+
+#include "language/suggestions.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+namespace {
+
+using language::near_miss;
+using language::suggestion;
+
+TEST(NearMiss, FindsTheNameThatIsOneEditAway) {
+    for (const char *text : {"ataType", "DaataType", "DxtaType", "DtaaType", "datatype"})
+        EXPECT_EQ(near_miss(text, {"DataType", "Description"}), "DataType") << text;
+}
+
+TEST(NearMiss, PrefersTheNearerName) {
+    EXPECT_EQ(near_miss("FistKey", {"LastKey", "FirstKey"}), "FirstKey");
+}
+
+TEST(NearMiss, ChoosesNoneOfTwoThatAreEquallyNear) {
+    EXPECT_EQ(near_miss("Ib", {"Id", "If"}), "");
+    EXPECT_EQ(near_miss("Ib", {"Id", "Id"}), "Id");
+}
+
+TEST(NearMiss, AllowsOneEditForThreeLettersAndThreeAtMost) {
+    EXPECT_EQ(near_miss("abcdef", {"xbxdef"}), "xbxdef");
+    EXPECT_EQ(near_miss("abcde", {"xbxde"}), "");
+    EXPECT_EQ(near_miss("abcdefghijklmno", {"xbxdxfghijklmno"}), "xbxdxfghijklmno");
+    EXPECT_EQ(near_miss("abcdefghijklmno", {"xbxdxfxhijklmno"}), "");
+}
+
+TEST(NearMiss, TakesTextsOfAnyLength) {
+    EXPECT_EQ(near_miss("", {"Id"}), "");
+    EXPECT_EQ(near_miss(std::string(64, 'a'), {}), "");
+    std::string name(67, 'a');
+    EXPECT_EQ(near_miss(std::string(64, 'a'), {name}), name);
+    EXPECT_EQ(near_miss(std::string(65, 'a'), {std::string(65, 'a')}), "");
+}
+
+TEST(Suggestion, NamesTheNearMissOrWhatIsKnown) {
+    EXPECT_EQ(suggestion("Nmae", {"Name", "Id"}), "did you mean `Name`?");
+    EXPECT_EQ(suggestion("Colour", {"Name", "Id", "DataType"}), "known are `Name`, `Id` and `DataType`");
+}
+
+TEST(Suggestion, ListsFortyNamesAtMost) {
+    EXPECT_EQ(suggestion("Colour", {}), "");
+    EXPECT_NE(suggestion("Colour", language::name_list(40, "Id")), "");
+    EXPECT_EQ(suggestion("Colour", language::name_list(41, "Id")), "");
+}
+
+TEST(TypeSuggestion, SaysWhichTypesAreNotAccepted) {
+    EXPECT_EQ(language::type_suggestion("int32", true), "did you mean `Int32`?");
+    EXPECT_EQ(language::type_suggestion("SBSS", false), "`SBS` is not supported");
+    EXPECT_EQ(language::type_suggestion("SDArry", true), "an element cannot be of type `SDArray`");
+    EXPECT_EQ(language::type_suggestion("SDArry", false), "did you mean `SDArray`?");
+}
+
+TEST(Listed, PutsAndBeforeTheLastName) {
+    EXPECT_EQ(language::listed({}), "");
+    EXPECT_EQ(language::listed({"Id"}), "`Id`");
+    EXPECT_EQ(language::listed({"Name", "Id"}), "`Name` and `Id`");
+}
+
+} // namespace

@@ -1,105 +1,15 @@
-/* cdef.cpp: cdef, which shows what is in a class definition database. */
+/* cdef.cpp: the command line of cdef, which shows what is in a class definition database. */
 
 #include "cdef/cdef.h"
-#include "cdef/dump/dump.h"
+#include "cdef/support/trouble.h"
+#include "text/shown.h"
 
 #include <CLI/CLI.hpp>
 
-#include <array>
-#include <cerrno>
-#include <cstdarg>
-#include <cstdio>
-#include <cstdlib>
-#include <cstring>
+#include <algorithm>
 #include <iostream>
-#include <unistd.h>
 
 namespace cdef {
-
-namespace {
-
-/* Errors that a database may have and is looked into all the same. */
-constexpr std::array tolerated = {cdb::CODE_CHECKSUM, cdb::CODE_RESERVED};
-
-bool tolerable(const cdb::finding &finding) {
-    return finding.broken->level == cdb::severity::warning ||
-           std::find(tolerated.begin(), tolerated.end(), finding.broken->code) != tolerated.end();
-}
-
-/* From the descriptor itself: it may be no file, or half read. */
-std::vector<std::byte> standard_input(std::error_code &error) {
-    constexpr std::size_t STEP = 65536;
-    std::vector<std::byte> contents;
-    for (ssize_t got = 1; got != 0;) {
-        std::size_t size = contents.size();
-        contents.resize(size + STEP);
-        got = read(STDIN_FILENO, contents.data() + size, STEP);
-        bool again = got < 0 && errno == EINTR;
-        if (got < 0 && !again) {
-            error = {errno, std::generic_category()};
-            return {};
-        }
-        contents.resize(size + (again ? 0 : static_cast<std::size_t>(got)));
-    }
-    return contents;
-}
-
-std::vector<std::byte> contents_of(const std::string &path) {
-    std::error_code error;
-    std::vector<std::byte> contents = path == "-" ? standard_input(error) : cdb::read_file(path.c_str(), error);
-    if (error)
-        throw trouble(path + ": " + error.message());
-    return contents;
-}
-
-} // namespace
-
-input::input(const std::string &path) : name(path), contents(contents_of(path)), db(contents) {}
-
-/* Names of files are part of messages, and a name may hold anything. */
-void tell(const std::string &trouble) {
-    std::fprintf(stderr, "cdef: %s\n", dump::harmless(trouble).c_str());
-}
-
-std::vector<cdb::finding> require_readable(const input &in) {
-    std::vector<cdb::finding> findings = cdb::verify(in.db);
-    if (!std::all_of(findings.begin(), findings.end(), tolerable))
-        throw trouble(in.name + ": not a sound database; 'cdef verify' says why");
-    return findings;
-}
-
-void require_readable_aloud(const input &in) {
-    std::vector<cdb::finding> findings = require_readable(in);
-    for (std::string_view code : tolerated) {
-        auto found = std::find_if(findings.begin(), findings.end(),
-                                  [code](const cdb::finding &f) { return f.broken->code == code; });
-        if (found != findings.end())
-            tell(in.name + ": " + std::string(found->broken->title));
-    }
-}
-
-void appendf(std::string &to, const char *format, ...) {
-    std::va_list arguments, again;
-    va_start(arguments, format);
-    va_copy(again, arguments);
-    int length = std::vsnprintf(nullptr, 0, format, arguments);
-    va_end(arguments);
-    std::size_t size = to.size();
-    to.resize(size + static_cast<std::size_t>(length) + 1);
-    std::vsnprintf(to.data() + size, static_cast<std::size_t>(length) + 1, format, again);
-    va_end(again);
-    to.pop_back();
-}
-
-void print(const std::string &text) {
-    if (std::fwrite(text.data(), 1, text.size(), stdout) != text.size() || std::fflush(stdout) != 0)
-        throw trouble(std::string("standard output: ") + std::strerror(errno));
-}
-
-bool wants_colour() {
-    const char *no_colour = std::getenv("NO_COLOR");
-    return (no_colour == nullptr || *no_colour == '\0') && isatty(STDOUT_FILENO) != 0;
-}
 
 namespace {
 
@@ -152,7 +62,7 @@ int run(int argc, char **argv) {
     app.set_version_flag("--version", "cdef " CDGEN_VERSION);
     app.require_subcommand(1);
     app.failure_message([](const CLI::App *program, const CLI::Error &usage) {
-        return "cdef: " + dump::harmless(complaint(*program, usage)) + "\nRun 'cdef --help' for more.\n";
+        return "cdef: " + text::escaped(complaint(*program, usage)) + "\nRun 'cdef --help' for more.\n";
     });
     int status = OK;
     for (auto add : {add_verify, add_dump, add_diff, add_source, add_check})

@@ -1,6 +1,7 @@
 /* main.cpp: the program's entry; everything else is a library that a fuzzer links too. */
 
 #include "cdef/cdef.h"
+#include "cdef/support/trouble.h"
 
 #include <cstdio>
 #include <cstdlib>

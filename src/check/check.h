@@ -128,10 +128,8 @@ name_list missing_names(const srtable_ctrl &kind, vx_uint32_t mask);
 /* ---- Forms (report/text.cpp, report/json.cpp) -------------------------------------------------------------
  */
 
-/* Nothing of a source, or of its name, may command a terminal: a '?' stands for each character that might. */
-std::string visible(std::string_view text);
-
-/* As compilers write it: a line for each finding and note, and the line of the source with a mark. */
+/* As compilers write it: a line for each finding and note, and the line of the source with a mark. Nothing of a source,
+ * or of its name, can steer a terminal: a '?' stands for each character that might. */
 std::string as_text(const result &checked);
 std::string as_json(std::span<const result> checked);
 std::string as_sarif(std::span<const result> checked);

@@ -3,7 +3,7 @@
 
 #include "check/session.h"
 
-#include "cdef/cdef.h"
+#include "cdef/support/trouble.h"
 
 #include <algorithm>
 #include <fcntl.h>

@@ -7,6 +7,7 @@
 
 #include <array>
 #include <optional>
+#include <stdexcept>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -27,13 +28,6 @@ struct thing {
     std::vector<fact> facts;
     std::vector<thing> parts;
 };
-
-/* In single quotes; what is not printable ASCII is written as \xNN. */
-std::string in_quotes(std::string_view text);
-
-/* The shortest text that tells the number from all others; a NaN's payload is part of it: nan(0x1). */
-std::string text_of(float number);
-std::string text_of(double number);
 
 /* A field that says where things stand in the file, how many or how long they are, and none of their contents; or when
  * the file was made. */
@@ -62,7 +56,13 @@ constexpr cdb::level level_of(table t) {
  * first list of them all the same, as if it were its own. By table, whether that is so. */
 std::array<bool, ATTRIBUTE_TABLES> without_valid_values(const cdb::resource_class &c, bool is_last_class);
 
-/* Throws trouble for a database whose values lead into each other so much that they cannot be told. */
+/* Thrown for a database made by hand whose references lead to the same texts or values so often that writing them all
+ * would fill the memory. */
+struct too_entangled : std::runtime_error {
+    using std::runtime_error::runtime_error;
+};
+
+/* Throws too_entangled. */
 thing meaning_of(const cdb::database &db);
 
 /* The offset of an out-of-line value at which no such value stands: of a Range that landed in the attribute of another

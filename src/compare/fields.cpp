@@ -2,7 +2,8 @@
  * shows under its own name. */
 
 #include "compare/fields.h"
-#include "cdef/cdef.h"
+
+#include "text/append.h"
 
 namespace cdef {
 
@@ -176,7 +177,7 @@ std::string text_of_bits(std::uint32_t bits, std::span<const props_t> known) {
         bits &= ~property.p;
     }
     if (bits != 0)
-        appendf(text, text.empty() ? "0x%x" : "+0x%x", bits);
+        text::appendf(text, text.empty() ? "0x%x" : "+0x%x", bits);
     if (text.empty())
         text = "none";
     return text;
@@ -192,7 +193,7 @@ std::string text_of_number(std::uint32_t number, form as) {
     case form::bits:
         return text_of_bits(number, {});
     case form::version:
-        appendf(text, "%u.%u.%u.%u", number >> 24, number >> 16 & 255, number >> 8 & 255, number & 255);
+        text::appendf(text, "%u.%u.%u.%u", number >> 24, number >> 16 & 255, number >> 8 & 255, number & 255);
         return text;
     case form::data_type:
         return std::string(cdb::name_of(static_cast<vx_data_type_t>(number)));

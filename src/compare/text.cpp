@@ -1,11 +1,11 @@
 /* text.cpp: texts and values as a person reads them. */
 
-#include "cdef/cdef.h"
 #include "compare/compare.h"
 
-#include <charconv>
-#include <cmath>
-#include <limits>
+#include "text/append.h"
+#include "text/hex.h"
+#include "text/number.h"
+#include "text/shown.h"
 
 namespace cdef {
 
@@ -14,60 +14,13 @@ namespace {
 constexpr std::size_t TIMES_FILE = 16;
 constexpr std::size_t AT_LEAST = 1 << 20;
 
-/* A NaN's sign and payload are part of the value. */
-template <class Float, class Bits> std::string text_of_nan(Float number) {
-    constexpr Bits QUIET = Bits{1} << (std::numeric_limits<Float>::digits - 2);
-    auto bits = std::bit_cast<Bits>(number);
-    std::string text = std::signbit(number) ? "-nan" : "nan";
-    if ((bits & (QUIET - 1)) != 0)
-        appendf(text, "(0x%llx)", static_cast<unsigned long long>(bits & (QUIET - 1)));
-    return text;
-}
-
-/* As few digits as tell the number from all others. */
-template <class Float, class Bits> std::string text_of_float(Float number) {
-    if (std::isnan(number))
-        return text_of_nan<Float, Bits>(number);
-    std::array<char, 64> text = {};
-    auto result = std::to_chars(text.data(), text.data() + text.size(), number);
-    return {text.data(), result.ptr};
-}
-
-std::string hex_of(std::span<const std::byte> data) {
-    std::string text = "0x";
-    for (std::byte b : data)
-        appendf(text, "%02x", std::to_integer<unsigned>(b));
-    return text;
-}
-
 std::string text_of_handle(const vx_resource_handle_t &handle) {
     std::string text;
-    appendf(text, "%x:%x:%x:%x:%x", handle.header, handle.id.id1, handle.id.id2, handle.id.id3, handle.id.id4);
+    text::appendf(text, "%x:%x:%x:%x:%x", handle.header, handle.id.id1, handle.id.id2, handle.id.id3, handle.id.id4);
     return text;
 }
 
 } // namespace
-
-std::string in_quotes(std::string_view text) {
-    std::string shown = "'";
-    for (char c : text) {
-        if (c == '\'' || c == '\\')
-            shown += {'\\', c};
-        else if (c >= ' ' && c <= '~')
-            shown += c;
-        else
-            appendf(shown, "\\x%02x", static_cast<unsigned>(static_cast<unsigned char>(c)));
-    }
-    return shown + "'";
-}
-
-std::string text_of(float number) {
-    return text_of_float<float, std::uint32_t>(number);
-}
-
-std::string text_of(double number) {
-    return text_of_float<double, std::uint64_t>(number);
-}
 
 std::optional<std::uint32_t> misplaced(const cdb::value &value, const cdb::bytes &strings) {
     constexpr std::size_t ALIGNMENT = 8;
@@ -95,13 +48,13 @@ teller::teller(std::size_t file_size) : left(file_size * TIMES_FILE + AT_LEAST) 
 
 void teller::spend(std::size_t amount) {
     if (amount > left)
-        throw trouble("values or texts that lead to the same place too often");
+        throw too_entangled("values or texts that lead to the same place too often");
     left -= amount;
 }
 
 std::string teller::text_of(std::string_view text) {
     spend(text.size());
-    return in_quotes(text);
+    return text::quoted_ascii(text);
 }
 
 /* The elements of structured data have types of their own. */
@@ -131,14 +84,14 @@ std::string teller::text_of(const cdb::value &value, const cdb::bytes &strings) 
     case VX_UINT64:
         return std::to_string(value.natural());
     case VX_FLOAT32:
-        return cdef::text_of(static_cast<float>(value.real()));
+        return text::shortest(static_cast<float>(value.real()));
     case VX_FLOAT64:
-        return cdef::text_of(value.real());
+        return text::shortest(value.real());
     case VX_CHAR_PTR:
         return text_of(value.text());
     case VX_BINARY_PTR:
         spend(value.binary().size());
-        return hex_of(value.binary());
+        return "0x" + text::hex_of(value.binary());
     case VX_RSRC_HANDLE_PTR:
         return text_of_handle(value.handle());
     default:

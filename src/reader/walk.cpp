@@ -2,6 +2,8 @@
 
 #include "reader/walk.h"
 
+#include "text/hex.h"
+
 #include <functional>
 #include <numeric>
 #include <utility>
@@ -9,15 +11,6 @@
 namespace cdb {
 
 namespace {
-
-std::string hex(std::uint64_t number) {
-    constexpr std::string_view digits = "0123456789abcdef";
-    std::string text;
-    do
-        text.insert(text.begin(), digits[number % 16]);
-    while ((number /= 16) != 0);
-    return "0x" + text;
-}
 
 /* What follows a header's field of that name in the file: the record sizes. */
 struct record_size {
@@ -114,14 +107,14 @@ void walker::report(check broken, const spot &at, std::string_view field, std::s
 }
 
 void walker::report_id(const spot &at, std::string_view field, vx_uint32_t found, vx_uint32_t expected) {
-    report(check::RECORD_ID, at, field, at.offset, hex(found), hex(expected));
+    report(check::RECORD_ID, at, field, at.offset, text::hex(found), text::hex(expected));
 }
 
 void walker::report_reserved(const spot &at, std::string_view field, std::span<const std::byte> stretch,
                              std::size_t file_offset) {
     auto wrong = std::find_if(stretch.begin(), stretch.end(), [](std::byte b) { return b != std::byte{0}; });
     auto distance = static_cast<std::size_t>(wrong - stretch.begin());
-    report(check::RESERVED, at, field, file_offset + distance, hex(std::to_integer<unsigned>(*wrong)), "0x0");
+    report(check::RESERVED, at, field, file_offset + distance, text::hex(std::to_integer<unsigned>(*wrong)), "0x0");
 }
 
 void walker::add_regions(const spot &at, const bytes &area, std::size_t offset, std::span<const field> fields) {
@@ -196,7 +189,7 @@ void walker::check_length() {
                db.header().cdb_hdr_length, expected);
     if (!db.recognised())
         report(check::FORMAT, whole_file, "cdb_hdr_format", offsetof(orb_cdb_header_t, cdb_hdr_format),
-               hex(db.header().cdb_hdr_format), hex(CDB_FORMAT));
+               text::hex(db.header().cdb_hdr_format), text::hex(CDB_FORMAT));
 }
 
 /* XORing words depends neither on their order nor on that of their bytes: it is done eight words at a time, and the
@@ -223,7 +216,7 @@ void walker::check_checksum() {
     auto turned = bytes(std::as_bytes(std::span(&sum, 1)), db.order()).number<std::uint32_t>(0);
     if (turned != db.header().cdb_hdr_checksum)
         report(check::CHECKSUM, whole_file, "cdb_hdr_checksum", offsetof(orb_cdb_header_t, cdb_hdr_checksum),
-               hex(db.header().cdb_hdr_checksum), hex(turned));
+               text::hex(db.header().cdb_hdr_checksum), text::hex(turned));
 }
 
 void walker::check_record_sizes() {

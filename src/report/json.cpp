@@ -1,7 +1,7 @@
 /* json.cpp: findings for programs: JSON of our own, and SARIF 2.1.0. */
 
-#include "cdef/cdef.h"
 #include "check/check.h"
+#include "report/json_text.h"
 
 #include <nlohmann/json.hpp>
 

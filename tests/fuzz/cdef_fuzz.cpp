@@ -7,6 +7,7 @@
  * the subcommands say of the same file goes together. */
 
 #include "cdef/cdef.h"
+#include "cdef/support/trouble.h"
 #include "compiler/cdgen.h"
 #include "fuzz.h"
 

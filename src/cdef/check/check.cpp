@@ -3,6 +3,8 @@
 #include "check/check.h"
 
 #include "cdef/cdef.h"
+#include "cdef/support/output.h"
+#include "cdef/support/trouble.h"
 
 #include <CLI/CLI.hpp>
 

@@ -1,7 +1,11 @@
 /* diff.cpp: what differs between two databases, and whether readers of the one can read the other. */
 
 #include "cdef/cdef.h"
+#include "cdef/support/input.h"
+#include "cdef/support/output.h"
+#include "cdef/support/trouble.h"
 #include "compare/compare.h"
+#include "report/json_text.h"
 
 #include <CLI/CLI.hpp>
 #include <nlohmann/json.hpp>
@@ -80,7 +84,7 @@ thing read(const std::string &path, std::unique_ptr<input> &in) {
     require_readable_aloud(*in);
     try {
         return meaning_of(in->db);
-    } catch (const trouble &t) {
+    } catch (const too_entangled &t) {
         throw trouble(path + ": " + t.what());
     }
 }

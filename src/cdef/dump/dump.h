@@ -3,7 +3,7 @@
 #ifndef CDGEN_CDEF_DUMP_H
 #define CDGEN_CDEF_DUMP_H
 
-#include "cdef/cdef.h"
+#include "cdef/support/input.h"
 
 #include <array>
 #include <variant>
@@ -25,7 +25,7 @@ struct words {
 };
 
 /* Text from the file: any bytes. */
-struct text {
+struct any_text {
     std::string_view bytes;
 };
 
@@ -51,31 +51,11 @@ struct checksum {
     std::string expected;
 };
 
-using fact = std::variant<none, std::int64_t, std::uint64_t, float, double, bits, word, words, text, binary,
+using fact = std::variant<none, std::int64_t, std::uint64_t, float, double, bits, word, words, any_text, binary,
                           vx_resource_handle_t, named, checksum>;
 
 /* As the listing shows it, on one line and free of bytes that a terminal would act upon. */
 std::string as_text(const fact &f);
-
-/* In double quotes, with everything escaped that is not printable UTF-8. */
-std::string quoted(std::string_view bytes);
-
-/* How many bytes the UTF-8 character in front of bytes takes; 0: there is none. */
-std::size_t utf8_length(std::string_view bytes);
-
-/* The same of one that may go to a terminal as it is; 0 also if it would steer the terminal, or hide. */
-std::size_t printable_length(std::string_view bytes);
-
-/* The text with the same things escaped as in quotes, but for quotes and backslashes: for messages. */
-std::string harmless(std::string_view bytes);
-
-/* Pairs of hexadecimal digits. */
-std::string hex_of(std::span<const std::byte> bytes);
-
-/* The shortest text that reads back the same: "0.1", "-0", "1e+300", "-inf", "nan", and "nan(0x1)" for one that is not
- * the usual one. */
-std::string shortest(float number);
-std::string shortest(double number);
 
 /* ---- Fields ---------------------------------------------------------------------------------------------------- */
 
@@ -142,24 +122,6 @@ cdb::class_tables tables_of(const cdb::database &db, std::size_t section);
 const cdb::bytes &lists_of(const cdb::class_tables &tables, cdb::target to);
 
 /* ---- Forms ----------------------------------------------------------------------------------------------------- */
-
-/* Text on its way to standard output, so that no listing has to be in memory as a whole. */
-class output {
-public:
-    std::string text;
-
-    void flush_if_full() {
-        if (text.size() >= FULL)
-            flush();
-    }
-    void flush() {
-        print(text);
-        text.clear();
-    }
-
-private:
-    static constexpr std::size_t FULL = 65536;
-};
 
 /* How a fact or a group of them is called. */
 struct label {

@@ -3,6 +3,8 @@
 #include "cdef/dump/dump.h"
 
 #include "format/names.h"
+#include "text/append.h"
+#include "text/hex.h"
 
 #include <chrono>
 
@@ -134,12 +136,6 @@ constexpr std::string_view section_types[] = {"CDB_DSECT_UNUSED",   "CDB_DSECT_E
                                               "CDB_DSECT_CMMAP",    "CDB_DSECT_CLASS_HASH"};
 static_assert(section_types[CDB_DSECT_CLASS_HASH] == "CDB_DSECT_CLASS_HASH");
 
-std::string hex_number(std::uint32_t number) {
-    std::string digits;
-    appendf(digits, "0x%x", number);
-    return digits;
-}
-
 /* The bits' names, the lowest first; what has no name follows as one number. */
 template <class NameOf> words names_of(std::uint32_t set, NameOf name_of) {
     words names;
@@ -152,7 +148,7 @@ template <class NameOf> words names_of(std::uint32_t set, NameOf name_of) {
             unknown |= set & bit;
     }
     if (unknown != 0)
-        names.list.push_back(hex_number(unknown));
+        names.list.push_back(text::hex(unknown));
     return names;
 }
 
@@ -194,15 +190,15 @@ fact time(std::uint32_t seconds) {
     year_month_day date(day);
     hh_mm_ss clock(moment - day);
     word w;
-    appendf(w.text, "%04d-%02u-%02uT%02d:%02d:%02dZ", int{date.year()}, unsigned{date.month()}, unsigned{date.day()},
-            static_cast<int>(clock.hours().count()), static_cast<int>(clock.minutes().count()),
-            static_cast<int>(clock.seconds().count()));
+    text::appendf(w.text, "%04d-%02u-%02uT%02d:%02d:%02dZ", int{date.year()}, unsigned{date.month()},
+                  unsigned{date.day()}, static_cast<int>(clock.hours().count()),
+                  static_cast<int>(clock.minutes().count()), static_cast<int>(clock.seconds().count()));
     return w;
 }
 
 fact version(std::uint32_t number) {
     word w;
-    appendf(w.text, "%u.%u.%u.%u", number >> 24, number >> 16 & 0xFF, number >> 8 & 0xFF, number & 0xFF);
+    text::appendf(w.text, "%u.%u.%u.%u", number >> 24, number >> 16 & 0xFF, number >> 8 & 0xFF, number & 0xFF);
     return w;
 }
 
@@ -306,7 +302,7 @@ fact fact_of(const cdb::value &value) {
     case VX_FLOAT64:
         return value.real();
     case VX_CHAR_PTR:
-        return text{value.text()};
+        return any_text{value.text()};
     case VX_BINARY_PTR:
         return binary{value.binary()};
     default: /* of those with elements these are facts of their own */

@@ -1,7 +1,11 @@
 /* hex.cpp: every byte of a file and what it is. Nothing is taken for granted: the file may be damaged. Each
  * line costs no more than its bytes deserve, so that what comes out is in proportion to the file. */
 
+#include "text/hex.h"
 #include "cdef/dump/dump.h"
+#include "cdef/support/output.h"
+#include "text/append.h"
+#include "text/shown.h"
 
 #include <unordered_map>
 
@@ -75,7 +79,7 @@ std::size_t hex_form::place_of(const cdb::bytes &area) const {
 std::string hex_form::place_text(const cdb::bytes &area, std::size_t at) const {
     std::string shown = std::to_string(at);
     if (at < area.size())
-        appendf(shown, " at %08zx", place_of(area) + at);
+        text::appendf(shown, " at %08zx", place_of(area) + at);
     return shown;
 }
 
@@ -105,7 +109,7 @@ vx_data_type_t hex_form::value_type(const cdb::region &r) const {
 /* The beginning of a text. */
 std::string excerpt(const cdb::bytes &strings, std::size_t at) {
     std::string_view text = strings.part(at, EXCERPT + 1).text(std::size_t{0});
-    return quoted(text.substr(0, EXCERPT)) + (text.size() > EXCERPT ? "..." : "");
+    return text::quoted(text.substr(0, EXCERPT)) + (text.size() > EXCERPT ? "..." : "");
 }
 
 vx_resource_handle_t handle_at(const cdb::bytes &file, std::size_t at) {
@@ -174,7 +178,7 @@ std::string hex_form::meaning_in(const cdb::region &r) {
     if (r.record == "vx_value_t")
         return meaning_of_value(r, array_type);
     if (r.record == "text")
-        return quoted(db.file().part(r.offset, r.size).text(std::size_t{0}));
+        return text::quoted(db.file().part(r.offset, r.size).text(std::size_t{0}));
     if (r.record == "handle")
         return as_text(handle_at(db.file(), r.offset));
     if (r.record == "length" || r.record == "var_id_t")
@@ -202,11 +206,11 @@ void hex_form::show(const cdb::region &r) {
         array_type = type_at(arrays, r.offset);
     std::string meaning = meaning_in(r);
     for (std::size_t at = 0; at < r.size; at += BYTES_A_LINE) {
-        appendf(out.text, "%08zx ", r.offset + at);
+        text::appendf(out.text, "%08zx ", r.offset + at);
         std::size_t start = out.text.size();
         auto line = db.file().part(r.offset + at, std::min(BYTES_A_LINE, r.size - at)).raw();
         for (std::size_t i = 0; i < line.size(); ++i)
-            out.text += " " + hex_of(line.subspan(i, 1));
+            out.text += " " + text::hex_of(line.subspan(i, 1));
         if (at == 0) {
             out.text.resize(start + BYTES_A_LINE * 3, ' ');
             out.text += "  " + name_of(r) + (meaning.empty() ? "" : ": ") + meaning;

@@ -1,6 +1,11 @@
 /* json.cpp: the facts as JSON. docs/dump.md has the schema. */
 
 #include "cdef/dump/dump.h"
+#include "cdef/support/output.h"
+#include "report/json_text.h"
+#include "text/hex.h"
+#include "text/number.h"
+#include "text/utf8.h"
 
 #include <nlohmann/json.hpp>
 
@@ -12,21 +17,6 @@ namespace cdef::dump {
 namespace {
 
 using json = nlohmann::ordered_json;
-
-bool is_utf8(std::string_view bytes) {
-    while (!bytes.empty()) {
-        std::size_t length = utf8_length(bytes);
-        if (length == 0)
-            return false;
-        bytes.remove_prefix(length);
-    }
-    return true;
-}
-
-std::string dumped(const json &data) {
-    constexpr bool ASCII_ONLY = true; /* whatever a terminal would act upon is escaped */
-    return data.dump(-1, ' ', ASCII_ONLY);
-}
 
 json json_of(none) {
     return nullptr;
@@ -40,7 +30,7 @@ json json_of(std::uint64_t number) {
 /* What JSON has no number for is told as text. Through its digits, so that 0.1 of 32 bits does not become
  * 0.10000000149011612. */
 template <class Real> json json_of_real(Real number) {
-    std::string digits = shortest(number);
+    std::string digits = text::shortest(number);
     if (!std::isfinite(number))
         return digits;
     double same = 0;
@@ -64,11 +54,11 @@ json json_of(const words &w) {
 }
 json json_of(binary b) {
     json data;
-    data["bytes"] = hex_of(b.bytes);
+    data["bytes"] = text::hex_of(b.bytes);
     return data;
 }
-json json_of(text t) {
-    return is_utf8(t.bytes) ? json(t.bytes) : json_of(binary{std::as_bytes(std::span(t.bytes))});
+json json_of(any_text t) {
+    return text::is_utf8(t.bytes) ? json(t.bytes) : json_of(binary{std::as_bytes(std::span(t.bytes))});
 }
 json json_of(const vx_resource_handle_t &h) {
     json data;
@@ -82,7 +72,7 @@ json json_of(const named &n) {
     json data;
     data["number"] = n.number;
     data["kind"] = known ? json(n.kind) : json();
-    data["name"] = known ? json_of(text{n.name}) : json();
+    data["name"] = known ? json_of(any_text{n.name}) : json();
     return data;
 }
 json json_of(const checksum &c) {
@@ -116,7 +106,7 @@ public:
     }
     void add(const label &what, const fact &f) override {
         next(what);
-        out.text += dumped(std::visit([](const auto &some) { return json_of(some); }, f));
+        out.text += json_line(std::visit([](const auto &some) { return json_of(some); }, f));
     }
 
     output out;
@@ -141,7 +131,7 @@ private:
         levels.back().is_empty = false;
         new_line();
         if (levels.back().end == '}')
-            out.text += dumped(what.key) + ": ";
+            out.text += json_line(what.key) + ": ";
     }
     void new_line() {
         out.text += '\n';

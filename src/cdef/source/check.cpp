@@ -1,8 +1,9 @@
 /* check.cpp: what no source can say: fields that no line sets, sections that are not made. */
 
-#include "cdef/cdef.h"
 #include "cdef/source/source.h"
+#include "cdef/support/trouble.h"
 #include "compare/compare.h"
+#include "text/shown.h"
 
 namespace cdef {
 
@@ -62,7 +63,7 @@ template <class Record> void require_plain(const Record &record, const std::stri
 
 void require_plain_definition(const cdb::sd_definition &definition, const std::string &place) {
     for (const cdb::sd_element &e : definition)
-        require_plain(e.record(), place + ", element " + in_quotes(e.name()));
+        require_plain(e.record(), place + ", element " + text::quoted_ascii(e.name()));
 }
 
 template <class List> void require_plain_attributes(const List &list, std::string_view kind) {
@@ -126,7 +127,7 @@ void no_source(const std::string &what, const std::string &why) {
 }
 
 std::string place_of(std::string_view kind, std::string_view name) {
-    return std::string(kind) + " " + in_quotes(name.substr(0, 100));
+    return std::string(kind) + " " + text::quoted_ascii(name.substr(0, 100));
 }
 
 void require_settable(const cdb::database &db) {

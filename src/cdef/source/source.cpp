@@ -3,9 +3,13 @@
 #include "cdef/source/source.h"
 
 #include "cdef/cdef.h"
-#include "cdef/dump/dump.h"
+#include "cdef/support/input.h"
+#include "cdef/support/output.h"
+#include "cdef/support/trouble.h"
 #include "compare/compare.h"
 #include "format/names.h"
+#include "text/append.h"
+#include "text/shown.h"
 
 #include <CLI/CLI.hpp>
 
@@ -106,7 +110,7 @@ void write_resource_class(source_writer &out, const class_plan &plan) {
 void write_control_definition(source_writer &out, const cdb::resource_class &c) {
     std::uint32_t version = c.record().rc_version;
     std::string text;
-    appendf(text, "%u.%u.%u.%u", version >> 24, version >> 16 & 255, version >> 8 & 255, version & 255);
+    text::appendf(text, "%u.%u.%u.%u", version >> 24, version >> 16 & 255, version >> 8 & 255, version & 255);
     out.blank_line();
     out.stanza("ControlDefinition", place_of("ResourceClass", c.name()));
     out.line("FileVersion", text);
@@ -175,7 +179,7 @@ void write_heading(source_writer &out, const std::vector<class_plan> &plans) {
             require_default_name(plan.view, output);
     if (output)
         write_long_comment(out, "The class is called after the output file, which has to be " +
-                                    in_quotes(*output + std::string(SUFFIX)) + ".");
+                                    text::quoted_ascii(*output + std::string(SUFFIX)) + ".");
 }
 
 std::string source_of(const cdb::database &db) {
@@ -203,7 +207,7 @@ std::string source_of(const cdb::database &db) {
 bool is_harmless(std::string_view text) {
     while (!text.empty()) {
         bool is_blank = text.front() == '\n' || text.front() == '\t';
-        std::size_t length = is_blank ? 1 : dump::printable_length(text);
+        std::size_t length = is_blank ? 1 : text::printable_length(text);
         if (length == 0)
             return false;
         text.remove_prefix(length);

@@ -3,6 +3,7 @@
 
 #include "cdef/source/source.h"
 #include "compare/compare.h"
+#include "text/shown.h"
 
 namespace cdef {
 
@@ -82,7 +83,7 @@ struct run_line {
 
 void write_element(source_writer &out, std::string_view stanza, const run_line &e, std::optional<std::size_t> index,
                    const std::string &place) {
-    out.stanza(stanza, place + ", element " + in_quotes(e.name));
+    out.stanza(stanza, place + ", element " + text::quoted_ascii(e.name));
     out.line("ElementName", e.name);
     out.line("Description", e.description);
     out.line("DisplayName", e.display_name);

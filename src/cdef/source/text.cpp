@@ -1,8 +1,10 @@
 /* text.cpp: lines and values, written so that the compiler reads back what they were written for. */
 
-#include "cdef/cdef.h"
 #include "cdef/source/source.h"
-#include "compare/compare.h"
+#include "text/append.h"
+#include "text/hex.h"
+#include "text/number.h"
+#include "text/shown.h"
 
 #include <cmath>
 
@@ -42,16 +44,9 @@ bool fits(std::string_view line) {
 /* Decimal, but where that would count as an underflow, which the compiler remembers and holds against later zeros. */
 template <class Float> std::string text_of_real(Float number) {
     if (std::fpclassify(number) != FP_SUBNORMAL)
-        return text_of(number);
+        return text::shortest(number);
     std::string text;
-    appendf(text, "%a", static_cast<double>(number));
-    return text;
-}
-
-std::string hex_of(std::span<const std::byte> data) {
-    std::string text = "0x";
-    for (std::byte b : data)
-        appendf(text, "%02x", std::to_integer<unsigned>(b));
+    text::appendf(text, "%a", static_cast<double>(number));
     return text;
 }
 
@@ -72,7 +67,7 @@ std::string escaped(std::byte b, plain which, bool in_pair) {
     if (usable && (safe || which == plain::all))
         return {c};
     std::string text;
-    appendf(text, "\\%03o", std::to_integer<unsigned>(b));
+    text::appendf(text, "\\%03o", std::to_integer<unsigned>(b));
     return text;
 }
 
@@ -92,7 +87,7 @@ bool ends_in_zeros(std::span<const std::byte> data) {
 std::vector<std::string> texts_of_binary(std::span<const std::byte> data, bool in_pair) {
     if (data.size() >= LINE_MAX_CHARS)
         return {};
-    std::vector<std::string> texts = only(hex_of(data));
+    std::vector<std::string> texts = only("0x" + text::hex_of(data));
     if (ends_in_zeros(data))
         for (plain which : {plain::printable, plain::all})
             texts.push_back(text_with_escapes(data, which, in_pair));
@@ -221,7 +216,7 @@ void source_writer::line_of_any(std::string_view name, const std::vector<std::st
         }
     }
     no_source(current, "no line can give its " + std::string(name) + " (" +
-                           (values.empty() ? "a value without a text" : in_quotes(values.front())) + ")");
+                           (values.empty() ? "a value without a text" : text::quoted_ascii(values.front())) + ")");
 }
 
 } // namespace cdef

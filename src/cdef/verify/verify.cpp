@@ -1,7 +1,12 @@
 /* verify.cpp: whether databases are sound, and what is wrong where. */
 
 #include "cdef/cdef.h"
-#include "cdef/dump/dump.h"
+#include "cdef/support/input.h"
+#include "cdef/support/output.h"
+#include "cdef/support/trouble.h"
+#include "report/json_text.h"
+#include "text/append.h"
+#include "text/shown.h"
 
 #include <CLI/CLI.hpp>
 #include <nlohmann/json.hpp>
@@ -40,9 +45,9 @@ std::string place_of(const cdb::finding &f) {
 /* One line, as compilers write them. */
 std::string line_of(const std::string &file, const cdb::finding &f) {
     std::string line;
-    appendf(line, "%s: %s: %s at offset %zu: %s: found %s, expected %s [%s]\n", dump::harmless(file).c_str(),
-            name_of(f.broken->level), place_of(f).c_str(), f.offset, std::string(f.broken->title).c_str(),
-            f.found.c_str(), f.expected.c_str(), std::string(f.broken->code).c_str());
+    text::appendf(line, "%s: %s: %s at offset %zu: %s: found %s, expected %s [%s]\n", text::escaped(file).c_str(),
+                  name_of(f.broken->level), place_of(f).c_str(), f.offset, std::string(f.broken->title).c_str(),
+                  f.found.c_str(), f.expected.c_str(), std::string(f.broken->code).c_str());
     return line;
 }
 

@@ -1,0 +1,398 @@
+/* walk.cpp: the walk over the facts of a database, in the order of the file. Each form takes them as it likes. */
+
+#include "cdef/dump/dump.h"
+
+#include "text/shown.h"
+
+#include <unordered_map>
+#include <unordered_set>
+
+namespace cdef::dump {
+
+namespace {
+
+/* The lists of a class's side tables. */
+struct list_kind {
+    cdb::target to;
+    std::string_view record;
+    std::string_view entry;
+    std::string_view entries_field;
+    const char *entry_title;
+    std::uint32_t id;
+};
+
+constexpr list_kind list_kinds[] = {
+    {cdb::target::variety_lists, "variety_list_t", "vl_entry_t", "vl_values", "variety", CDB_ID_VARIETY_LIST},
+    {cdb::target::valid_vals, "valid_values_t", "vv_entry_t", "vv_values", "valid value", CDB_ID_VALID_VALUES},
+    {cdb::target::sd_defs, "sd_def_t", "sd_field_t", "sd_fields", "element", CDB_ID_SD_DEF},
+};
+
+constexpr std::size_t LIST_COUNT = 4; /* where it stands, in all three */
+static_assert(offsetof(variety_list_t, vl_count) == LIST_COUNT && offsetof(valid_values_t, vv_count) == LIST_COUNT &&
+              offsetof(sd_def_t, sd_count) == LIST_COUNT);
+
+/* The records that a class has tables of. */
+struct class_table {
+    cdb_ref_t rsrc_class_t::*place;
+    std::uint16_t rsrc_class_t::*count;
+    std::string_view record;
+    std::string_view key;
+    const char *title;
+};
+
+constexpr class_table class_tables[] = {
+    {&rsrc_class_t::u_rc_pattrsC, &rsrc_class_t::rc_num_pattrsC, "rsrc_pattr_t", "persistent_class_attributes",
+     "persistent class attribute"},
+    {&rsrc_class_t::u_rc_dattrsC, &rsrc_class_t::rc_num_dattrsC, "rsrc_dattr_t", "dynamic_class_attributes",
+     "dynamic class attribute"},
+    {&rsrc_class_t::u_rc_pattrs, &rsrc_class_t::rc_num_pattrs, "rsrc_pattr_t", "persistent_resource_attributes",
+     "persistent resource attribute"},
+    {&rsrc_class_t::u_rc_dattrs, &rsrc_class_t::rc_num_dattrs, "rsrc_dattr_t", "dynamic_resource_attributes",
+     "dynamic resource attribute"},
+    {&rsrc_class_t::u_rc_actionsC, &rsrc_class_t::rc_num_actionsC, "rsrc_action_t", "class_actions", "class action"},
+    {&rsrc_class_t::u_rc_actions, &rsrc_class_t::rc_num_actions, "rsrc_action_t", "resource_actions",
+     "resource action"},
+    {&rsrc_class_t::u_rc_errors, &rsrc_class_t::rc_num_errors, "rsrc_error_t", "errors", "error"},
+    {&rsrc_class_t::u_rc_depends, &rsrc_class_t::rc_num_depends, "rsrc_depend_t", "dependencies", "dependency"},
+};
+
+struct section_kind {
+    cdb_dsect_type_t type;
+    std::string_view record;
+    std::string_view key;
+    const char *title;
+};
+
+constexpr section_kind section_kinds[] = {
+    {CDB_DSECT_CLASS, "rsrc_class_t", "class", "class"},
+    {CDB_DSECT_RSRC_MGR, "rsrc_mgr_t", "manager", "manager"},
+    {CDB_DSECT_CMMAP, "rsrc_cmmap_t", "map", "map"},
+    {CDB_DSECT_VAR_CLASS, "rsrc_variable_class_t", "variable_class", "variable class"},
+    {CDB_DSECT_CLASS_HASH, "rsrc_class_hash_t", "class_hash", "class hash"},
+};
+
+/* A record in an area, and what its references lead into. */
+struct record_at {
+    const record_format &format;
+    cdb::bytes area;
+    std::size_t at;
+    cdb::class_tables tables;
+    vx_data_type_t type = VX_UNKNOWN; /* of its values, where the record itself does not name one */
+};
+
+using named_by_number = std::unordered_map<std::uint32_t, named>;
+
+named found_in(const named_by_number &known, std::uint32_t number) {
+    auto found = known.find(number);
+    return found == known.end() ? named{number, {}, {}} : found->second;
+}
+
+class walker {
+public:
+    walker(const cdb::database &walked, sink &to, bool offsets) : db(walked), out(to), with_offsets(offsets) {}
+
+    void show_file();
+
+private:
+    void show_section(std::size_t index);
+    void show_root(std::size_t index, const section_kind &kind);
+    void show_class_tables(const cdb::resource_class &rc);
+    void show_variables(const cdb::variable_class &vc);
+    void show_hash_blocks(const cdb::bytes &section);
+
+    void open(const record_at &r, std::string_view key, std::string title);
+    void show_record(const record_at &r, std::string_view key, const std::string &title);
+    void show_fields(const record_at &r);
+    void show_number(const record_at &r, const cdb::field &f);
+    void show_reference(const record_at &r, const cdb::field &f);
+    void show_place(const record_at &r, const cdb::field &f);
+    void show_list(const record_at &r, const cdb::field &f);
+    void show_value(const label &what, const cdb::value &value, std::size_t cell, std::size_t strings);
+    void show_element(vx_data_type_t container, const cdb::value &element, std::size_t cell, std::size_t strings);
+
+    named locator(const cdb::class_tables &tables, std::uint32_t number) const;
+    void collect_named();
+    void collect_findings();
+    std::size_t place_of(const cdb::bytes &area) const;
+
+    const cdb::database &db;
+    sink &out;
+    bool with_offsets;
+    checksum sum;
+    std::unordered_set<std::size_t> strays; /* where references and cells stand that mean nothing */
+    /* Of several with one number, the first. */
+    named_by_number variables; /* dynamic attributes, by variable ID */
+    named_by_number managers;
+};
+
+label same(std::string_view name) {
+    return {name, std::string(name)};
+}
+
+/* ---- What numbers stand for ------------------------------------------------------------------------------------ */
+
+named walker::locator(const cdb::class_tables &tables, std::uint32_t number) const {
+    constexpr std::uint32_t CUT = 0xFFFF; /* what a locator keeps of an ID */
+    for (const cdb::persistent_attribute &attr :
+         cdb::resource_class(tables.section).persistent_attributes(cdb::level::of_resource))
+        if ((static_cast<std::uint32_t>(attr.id()) & CUT) == number)
+            return {number, "persistent resource attribute", attr.name()};
+    return {number, {}, {}};
+}
+
+void walker::collect_named() {
+    auto collect = [this](const auto &attributes, std::uint32_t mark, std::string_view kind) {
+        for (const cdb::dynamic_attribute &attr : attributes) {
+            std::uint32_t id = static_cast<std::uint32_t>(attr.id()) | mark;
+            variables.try_emplace(id, named{id, kind, attr.name()});
+        }
+    };
+    for (const cdb::resource_class &rc : db.classes()) {
+        collect(rc.dynamic_attributes(cdb::level::of_class), VAR_ID_CLASS_ATTR, "dynamic class attribute");
+        collect(rc.dynamic_attributes(cdb::level::of_resource), 0, "dynamic resource attribute");
+    }
+    for (const cdb::manager &m : db.managers())
+        managers.try_emplace(m.record().rm_id, named{m.record().rm_id, "manager", m.name()});
+}
+
+/* The compiler can leave an attribute references to another's valid values, and a range of another type; the verifier
+ * tells which. Whatever they lead to is not the attribute's, and may be there for others many times over. */
+void walker::collect_findings() {
+    for (const cdb::finding &f : cdb::verify(db)) {
+        if (f.broken->code == cdb::CODE_CHECKSUM)
+            sum = {f.found, f.expected};
+        if (f.broken->code == cdb::CODE_CUT_SHORT || f.broken->code == cdb::CODE_RANGE_ASTRAY)
+            strays.insert(f.offset);
+    }
+}
+
+/* Of an area in the file. */
+std::size_t walker::place_of(const cdb::bytes &area) const {
+    return area.size() == 0 ? 0 : static_cast<std::size_t>(area.raw().data() - db.file().raw().data());
+}
+
+/* ---- Values ---------------------------------------------------------------------------------------------------- */
+
+/* An array's elements are of one type, so they are told without it; those of structured data with it. */
+void walker::show_element(vx_data_type_t container, const cdb::value &element, std::size_t cell, std::size_t strings) {
+    std::string type(cdb::name_of(element.type()));
+    if (container != VX_SD_PTR)
+        return show_value({{}, type}, element, cell, strings);
+    out.open({{}, {}});
+    out.add({"data_type", {}}, word{type});
+    show_value({"value", type}, element, cell + offsetof(vx_structured_data_element_t, value), strings);
+    out.close();
+}
+
+/* cell, strings: where in the file the value's cell is, and the strings that it may lead into. */
+void walker::show_value(const label &what, const cdb::value &value, std::size_t cell, std::size_t strings) {
+    bool holds_elements = value.type() == VX_SD_PTR || cdb::is_array(value.type());
+    if (strays.contains(cell))
+        return out.add(what, none{});
+    if (!holds_elements || !value.present())
+        return out.add(what, fact_of(value));
+    std::string type(cdb::name_of(value.type()));
+    cdb::value_list elements = value.elements();
+    std::string title = what.title;
+    if (title != type)
+        title += ": " + type;
+    out.open_list({what.key, title + (elements.empty() ? ", empty" : "")});
+    std::size_t element_size = value.type() == VX_SD_PTR ? sizeof(vx_structured_data_element_t) : sizeof(vx_value_t);
+    std::size_t element_at = strings + *value.place() + cdb::value::ELEMENTS;
+    for (std::size_t i = 0; i < elements.size(); ++i)
+        show_element(value.type(), elements[i], element_at + i * element_size, strings);
+    out.close();
+}
+
+/* ---- Records --------------------------------------------------------------------------------------------------- */
+
+void walker::open(const record_at &r, std::string_view key, std::string title) {
+    if (const cdb::field *name = find_field(r.format, r.format.name_field)) {
+        auto place = r.area.number<std::uint32_t>(r.at + name->offset);
+        if (place != CDB_NONE)
+            title += " " + text::quoted(r.tables.strings.text(std::size_t{place}));
+    }
+    if (!with_offsets)
+        return out.open({key, std::move(title)});
+    std::size_t at = place_of(r.area) + r.at;
+    out.open({key, title + " at " + std::to_string(at)});
+    out.add({"at", {}}, std::uint64_t{at});
+}
+
+void walker::show_record(const record_at &r, std::string_view key, const std::string &title) {
+    open(r, key, title);
+    show_fields(r);
+    out.close();
+}
+
+void walker::show_fields(const record_at &r) {
+    for (const cdb::field &f : r.format.fields)
+        switch (f.kind) {
+        case cdb::field_kind::number:
+            show_number(r, f);
+            break;
+        case cdb::field_kind::reference:
+            show_reference(r, f);
+            break;
+        case cdb::field_kind::value: {
+            auto type = f.type_at == cdb::TYPE_OF_OWNER ? r.type : r.area.number<vx_data_type_t>(r.at + f.type_at);
+            show_value(same(f.name), {r.area, r.at + f.offset, type, r.tables.strings},
+                       place_of(r.area) + r.at + f.offset, place_of(r.tables.strings));
+            break;
+        }
+        case cdb::field_kind::reserved: {
+            auto raw = r.area.part(r.at + f.offset, std::size_t{f.width} * f.count).raw();
+            if (std::any_of(raw.begin(), raw.end(), [](std::byte b) { return b != std::byte{0}; }))
+                out.add(same(f.name), binary{raw});
+            break;
+        }
+        case cdb::field_kind::entries:
+            break;
+        }
+}
+
+void walker::show_number(const record_at &r, const cdb::field &f) {
+    meaning as = meaning_of(r.format.record, f);
+    std::uint32_t number = number_in(r.area, r.at, f);
+    fact shown = fact_of(as, number);
+    if (as == meaning::CHECKSUM)
+        shown = sum;
+    if (as == meaning::OFFSET && !with_offsets)
+        return;
+    if (as == meaning::LOCATOR && !std::holds_alternative<none>(shown))
+        shown = locator(r.tables, number);
+    if (as == meaning::MANAGER)
+        shown = found_in(managers, number);
+    out.add(same(f.name), shown);
+}
+
+void walker::show_reference(const record_at &r, const cdb::field &f) {
+    meaning as = meaning_of(r.format.record, f);
+    auto place = r.area.number<std::uint32_t>(r.at + f.offset);
+    if (as == meaning::OFFSET || as == meaning::UNUSED) {
+        if (with_offsets || (as == meaning::UNUSED && place != 0))
+            show_place(r, f);
+    } else if (f.to != cdb::target::strings)
+        show_list(r, f);
+    else if (place == CDB_NONE || place >= r.tables.strings.size())
+        out.add(same(f.name), none{});
+    else
+        out.add(same(f.name), any_text{r.tables.strings.text(std::size_t{place})});
+}
+
+/* A reference as it stands, or an array of them. */
+void walker::show_place(const record_at &r, const cdb::field &f) {
+    auto add = [&](const label &what, std::size_t i) {
+        auto place = r.area.number<std::uint32_t>(r.at + f.offset + i * f.width);
+        out.add(what, place == CDB_NONE ? fact(none{}) : fact(std::uint64_t{place}));
+    };
+    if (f.count == 1)
+        return add(same(f.name), 0);
+    out.open_list(same(f.name));
+    for (std::size_t i = 0; i < f.count; ++i)
+        add({{}, std::to_string(i)}, i);
+    out.close();
+}
+
+/* Where no list stands, a class was cut short, and the reference means nothing. */
+void walker::show_list(const record_at &r, const cdb::field &f) {
+    const list_kind &kind =
+        *std::find_if(std::begin(list_kinds), std::end(list_kinds), [&f](const list_kind &k) { return k.to == f.to; });
+    const cdb::bytes &lists = lists_of(r.tables, f.to);
+    std::size_t at = r.area.number<std::uint32_t>(r.at + f.offset);
+    if (at == CDB_NONE || lists.number<std::uint32_t>(at) != kind.id ||
+        strays.contains(place_of(r.area) + r.at + f.offset))
+        return out.add(same(f.name), none{});
+    record_at list = {format_of(kind.record), lists, at, r.tables};
+    open(list, f.name, std::string(f.name));
+    show_fields(list);
+    vx_data_type_t type = cdb::element_type(data_type_in(r.format, r.area, r.at));
+    record_at entry = {format_of(kind.entry), lists, at + list.format.size, r.tables, type};
+    std::size_t count =
+        cdb::count_inside(lists, entry.at, lists.number<std::uint32_t>(at + LIST_COUNT), entry.format.size);
+    out.open_list({kind.entries_field, {}});
+    for (std::size_t i = 0; i < count; ++i, entry.at += entry.format.size)
+        show_record(entry, {}, kind.entry_title);
+    out.close();
+    out.close();
+}
+
+/* ---- Sections -------------------------------------------------------------------------------------------------- */
+
+void walker::show_class_tables(const cdb::resource_class &rc) {
+    const rsrc_class_t &record = rc.record();
+    const cdb::bytes &section = rc.side_tables().section;
+    for (const class_table &table : class_tables) {
+        std::size_t at = (record.*table.place).offset[0];
+        record_at entry = {format_of(table.record), section, at, rc.side_tables()};
+        /* At 0 stands the class: it is how a table says that it has no place. */
+        std::size_t count = at == 0 ? 0 : cdb::count_inside(section, at, record.*table.count, entry.format.size);
+        out.open_list({table.key, {}});
+        for (std::size_t i = 0; i < count; ++i, entry.at += entry.format.size)
+            show_record(entry, {}, table.title);
+        out.close();
+    }
+}
+
+void walker::show_variables(const cdb::variable_class &vc) {
+    out.open_list({"variables", {}});
+    for (const cdb::variable_id &id : vc.variable_ids())
+        out.add({{}, "variable"}, found_in(variables, id.number));
+    out.close();
+}
+
+void walker::show_hash_blocks(const cdb::bytes &section) {
+    record_at block = {format_of("rc_hash_block_t"), section, offsetof(rsrc_class_hash_t, rc_hash_blocks), {}};
+    auto told = section.number<std::uint32_t>(offsetof(rsrc_class_hash_t, rch_num_hash_blocks));
+    std::size_t count = cdb::count_inside(section, block.at, told, block.format.size);
+    out.open_list({"rc_hash_blocks", {}});
+    for (std::size_t i = 0; i < count; ++i, block.at += block.format.size)
+        show_record(block, {}, "block");
+    out.close();
+}
+
+void walker::show_root(std::size_t index, const section_kind &kind) {
+    record_at root = {format_of(kind.record), db.section(index), 0, tables_of(db, index)};
+    open(root, kind.key, kind.title);
+    show_fields(root);
+    if (kind.type == CDB_DSECT_CLASS)
+        show_class_tables(cdb::resource_class(root.area));
+    if (kind.type == CDB_DSECT_VAR_CLASS)
+        show_variables(cdb::variable_class(root.area));
+    if (kind.type == CDB_DSECT_CLASS_HASH)
+        show_hash_blocks(root.area);
+    out.close();
+}
+
+void walker::show_section(std::size_t index) {
+    out.open({{}, "section"});
+    std::size_t anchor_at = sizeof(orb_cdb_header_t) + index * sizeof(cdb_dsect_anchor_t);
+    show_fields({format_of("cdb_dsect_anchor_t"), db.file(), anchor_at, {}});
+    auto kind = std::find_if(std::begin(section_kinds), std::end(section_kinds),
+                             [&](const section_kind &k) { return k.type == db.anchor(index).cda_type; });
+    if (kind != std::end(section_kinds))
+        show_root(index, *kind);
+    out.close();
+}
+
+void walker::show_file() {
+    collect_findings();
+    collect_named();
+    out.open({{}, {}});
+    out.add({"byte_order", "byte order"}, word{db.order() == std::endian::big ? "big-endian" : "little-endian"});
+    out.add({"size", "size"}, std::uint64_t{db.file().size()});
+    show_record({format_of("orb_cdb_header_t"), db.file(), 0, {}}, "header", "header");
+    out.open_list({"sections", {}});
+    for (std::size_t i = 0; i < db.section_count(); ++i)
+        show_section(i);
+    out.close();
+    out.close();
+}
+
+} // namespace
+
+void walk(const cdb::database &db, sink &to, bool with_offsets) {
+    walker(db, to, with_offsets).show_file();
+}
+
+} // namespace cdef::dump

@@ -1,0 +1,34 @@
+/* input.h: the database that a subcommand is given. */
+#ifndef CDGEN_CDEF_INPUT_H
+#define CDGEN_CDEF_INPUT_H
+
+#include "cdb_view.h"
+
+#include <string>
+#include <vector>
+
+namespace cdef {
+
+/* A database read from a file; "-" is standard input. */
+struct input {
+    /* Throws trouble when it cannot be read. */
+    explicit input(const std::string &path);
+    input(const input &) = delete;
+    input &operator=(const input &) = delete;
+
+    std::string name; /* for messages */
+    std::vector<std::byte> contents;
+    cdb::database db;
+};
+
+/* Throws trouble unless the database's records and values can be relied on: its only errors may be a wrong checksum
+ * and filling that is not zero. Returns its findings. */
+std::vector<cdb::finding> require_readable(const input &in);
+
+/* The same, and reports on standard error which of these two errors it has, each once: for subcommands whose output
+ * does not show it. */
+void require_readable_aloud(const input &in);
+
+} // namespace cdef
+
+#endif

@@ -1,0 +1,36 @@
+/* output.h: standard output. */
+#ifndef CDGEN_CDEF_OUTPUT_H
+#define CDGEN_CDEF_OUTPUT_H
+
+#include <cstddef>
+#include <string>
+
+namespace cdef {
+
+/* Writes to standard output; throws trouble if that fails. */
+void print(const std::string &text);
+
+/* True if terminal colours are wanted: standard output is a terminal, and NO_COLOR is not set or empty. */
+bool wants_colour();
+
+/* Text on its way to standard output, so that a long listing need not be in memory as a whole. */
+class output {
+public:
+    std::string text;
+
+    void flush_if_full() {
+        if (text.size() >= FULL)
+            flush();
+    }
+    void flush() {
+        print(text);
+        text.clear();
+    }
+
+private:
+    static constexpr std::size_t FULL = 65536; /* bytes */
+};
+
+} // namespace cdef
+
+#endif

@@ -1,0 +1,16 @@
+/* trouble.cpp: messages on standard error. */
+
+#include "cdef/support/trouble.h"
+
+#include "text/shown.h"
+
+#include <cstdio>
+
+namespace cdef {
+
+/* File names are part of messages, and a name may hold anything. */
+void tell(const std::string &message) {
+    std::fprintf(stderr, "cdef: %s\n", text::escaped(message).c_str());
+}
+
+} // namespace cdef

@@ -1,0 +1,24 @@
+/* json_text.cpp: JSON as the programs print it. */
+
+#include "report/json_text.h"
+
+#include <nlohmann/json.hpp>
+
+namespace cdef {
+
+namespace {
+
+constexpr bool ASCII_ONLY = true; /* whatever a terminal would act upon is escaped */
+
+} // namespace
+
+std::string json_text(const nlohmann::ordered_json &data) {
+    constexpr int INDENT = 2;
+    return data.dump(INDENT, ' ', ASCII_ONLY, nlohmann::ordered_json::error_handler_t::replace) + "\n";
+}
+
+std::string json_line(const nlohmann::ordered_json &data) {
+    return data.dump(-1, ' ', ASCII_ONLY);
+}
+
+} // namespace cdef

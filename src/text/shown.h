@@ -1,0 +1,29 @@
+/* shown.h: texts of unknown origin as they may be shown: nothing in them can steer a terminal, break a line or hide. */
+#ifndef CDGEN_TEXT_SHOWN_H
+#define CDGEN_TEXT_SHOWN_H
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+
+namespace text {
+
+/* The size in bytes of the UTF-8 character at the start of bytes if a terminal can show it as it is, else 0. */
+std::size_t printable_length(std::string_view bytes);
+
+/* The text with everything escaped that is not printable UTF-8, as \n, \t, \r or \xNN: for messages. Quotes and
+ * backslashes stay, so that the usual text stays as it is. */
+std::string escaped(std::string_view bytes);
+
+/* The same in double quotes, with quotes and backslashes escaped too. */
+std::string quoted(std::string_view bytes);
+
+/* In single quotes; everything that is not printable ASCII is written as \xNN. */
+std::string quoted_ascii(std::string_view bytes);
+
+/* The text with a '?' for each character that is not printable, except tabs: as many columns as the text has. */
+std::string masked(std::string_view bytes);
+
+} // namespace text
+
+#endif

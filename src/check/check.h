@@ -15,26 +15,7 @@
 
 namespace cdef::check {
 
-/* ---- Messages (messages.cpp) ----------------------------------------------------------------------- */
-
-/* What of a line is marked. */
-enum class mark_kind { none, text, name, value, item /* the part of the value that the message names */ };
-
-/* Whose fault it is. */
-enum class blame { source, program, surroundings };
-
-/* An error of the compiler: what its text begins with, or what follows the item that it begins with. */
-struct message {
-    const char *code; /* for ever */
-    const char *text;
-    mark_kind mark;
-    blame whose;
-};
-
-extern const std::span<const message> messages;
-
-/* The message that a compilation ended with. */
-const message &message_of(const fatal_exit &failure);
+/* ---- Warnings (messages.cpp) ----------------------------------------------------------------------- */
 
 enum warning_id {
     SD_RUN_AT_END,

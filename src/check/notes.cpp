@@ -185,17 +185,34 @@ void keys(noting &n) {
 }
 
 struct noting_of {
-    std::string_view code;
+    message_id id;
     void (*add)(noting &);
 };
 
 constexpr noting_of notings[] = {
-    {"S102", no_stanza},       {"S106", unknown_name},     {"S108", too_early},    {"S109", repeated},
-    {"S110", no_sd_attribute}, {"S111", incomplete},       {"S112", no_class},     {"S113", no_class},
-    {"S114", no_class},        {"S115", no_class},         {"S116", no_class},     {"S117", no_class},
-    {"S118", second_map},      {"S201", unknown_property}, {"S202", unknown_type}, {"S203", unknown_variable_type},
-    {"S207", bad_value},       {"S210", wrong_index},      {"S214", bad_default},  {"S215", bad_default},
-    {"S216", bad_default},     {"S303", no_manager},       {"S304", keys},
+    {MSG_NO_STANZA, no_stanza},
+    {MSG_UNKNOWN_ATTRIBUTE, unknown_name},
+    {MSG_OPTIONAL_TOO_EARLY, too_early},
+    {MSG_REPEATED_ATTRIBUTE, repeated},
+    {MSG_NO_SD_ATTRIBUTE, no_sd_attribute},
+    {MSG_INCOMPLETE_STANZA, incomplete},
+    {MSG_NO_CLASS_FOR_PATTR, no_class},
+    {MSG_NO_CLASS_FOR_PATTR_C, no_class},
+    {MSG_NO_CLASS_FOR_DATTR, no_class},
+    {MSG_NO_CLASS_FOR_ACTION, no_class},
+    {MSG_NO_CLASS_FOR_SD, no_class},
+    {MSG_NO_STRING_TABLE, no_class},
+    {MSG_SECOND_MAP, second_map},
+    {MSG_INVALID_PROPERTY, unknown_property},
+    {MSG_INVALID_DATA_TYPE, unknown_type},
+    {MSG_INVALID_VARIABLE_TYPE, unknown_variable_type},
+    {MSG_INVALID_VALUE, bad_value},
+    {MSG_INDEX_NOT_CONSECUTIVE, wrong_index},
+    {MSG_SBS_TYPE, bad_default},
+    {MSG_NO_ELEMENT_DEFAULT, bad_default},
+    {MSG_NO_ELEMENT_INITIAL, bad_default},
+    {MSG_NO_MANAGER, no_manager},
+    {MSG_KEYS_REVERSED, keys},
 };
 
 } // namespace
@@ -203,7 +220,7 @@ constexpr noting_of notings[] = {
 void session::add_notes(finding &found, const fatal_exit &failure, int failed_kind) {
     noting n = {*this, found, failure, failed_kind};
     for (const noting_of &each : notings)
-        if (each.code == found.code)
+        if (each.id == failure.id)
             each.add(n);
 }
 

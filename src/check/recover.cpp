@@ -60,8 +60,9 @@ bool is_typed(int attr_type) {
     }
 }
 
-bool is_message(const message &known, const char *code) {
-    return std::string_view(known.code) == code;
+constexpr bool wants_class(message_id id) {
+    return id == MSG_NO_CLASS_FOR_PATTR || id == MSG_NO_CLASS_FOR_PATTR_C || id == MSG_NO_CLASS_FOR_DATTR ||
+           id == MSG_NO_CLASS_FOR_ACTION || id == MSG_NO_CLASS_FOR_SD;
 }
 
 /* What a stanza mostly begins with. */
@@ -78,23 +79,23 @@ std::string_view name_in(const attr_text &text) {
 
 /* Whether an error is no consequence of one that has been told. */
 bool session::may_follow(const fatal_exit &failure) {
-    const message &known = message_of(failure);
+    const message &known = message_of(failure.id);
     return out.errors == 0 || known.whose != blame::program;
 }
 
 /* Whether the stanza that an error misses has been told of: it is broken, or its header is lost. */
 bool session::told_otherwise(const fatal_exit &failure) const {
-    const message &known = message_of(failure);
     bool map_broken = cx.stanzas[SC_CLASS_TO_MANAGER_MAPPING].broken;
-    if (is_message(known, "S301") || is_message(known, "S117"))
+    if (failure.id == MSG_NO_CLASSES || failure.id == MSG_NO_STRING_TABLE)
         return may_be_lost(SC_CONTROL_DEFINITION);
-    if (is_message(known, "S302"))
+    if (failure.id == MSG_NO_MAPS)
         return may_be_lost(SC_CLASS_TO_MANAGER_MAPPING);
-    if (is_message(known, "S303")) /* without a map, that has been told */
+    if (failure.id == MSG_NO_MANAGER) /* without a map, that has been told */
         return map_broken || map_line == 0;
-    if (is_message(known, "S304"))
+    if (failure.id == MSG_KEYS_REVERSED)
         return map_broken;
-    bool element_type = is_message(known, "S214") || is_message(known, "S215") || is_message(known, "S216");
+    bool element_type =
+        failure.id == MSG_SBS_TYPE || failure.id == MSG_NO_ELEMENT_DEFAULT || failure.id == MSG_NO_ELEMENT_INITIAL;
     return element_type && types_told && odd_elements.empty();
 }
 
@@ -139,7 +140,7 @@ void session::settle_broken(int next_kind) {
 void session::abandon(int failed_kind, const fatal_exit &failure) {
     if (!is_sd_kind(failed_kind))
         drop_record(failed_kind);
-    else if (is_message(message_of(failure), "S111"))
+    else if (failure.id == MSG_INCOMPLETE_STANZA)
         complete_element(cx);
     else
         close_run(cx);
@@ -197,7 +198,6 @@ void session::open_stanza(int new_kind, bool broken) {
 
 /* Whether the header is to be tried again. */
 bool session::recover_header(const fatal_exit &failure, int new_kind) {
-    const message &known = message_of(failure);
     if (cx.completing >= 0) {
         int failed = is_sd_kind(cx.completing) ? sd_kind : cx.completing;
         if (!cx.stanzas[index_of(failed)].broken && !told_otherwise(failure) && may_follow(failure))
@@ -206,14 +206,14 @@ bool session::recover_header(const fatal_exit &failure, int new_kind) {
         abandon(failed, failure);
         return true;
     }
-    if (cx.cb_rsrc_class.rc_cb_ID == 0 && std::string_view(failure.msg).starts_with("No class for")) {
+    if (cx.cb_rsrc_class.rc_cb_ID == 0 && wants_class(failure.id)) {
         if (!may_be_lost(SC_CONTROL_DEFINITION))
             add_notes(error(failure, all_of_line()), failure, new_kind);
         header_told = true;
         forge_class();
         return true;
     }
-    bool no_attribute = is_message(known, "S110");
+    bool no_attribute = failure.id == MSG_NO_SD_ATTRIBUTE;
     bool told = out.errors > header_errors || kind < 0 || cx.stanzas[index_of(kind)].broken;
     bool consequence = no_attribute && told && out.errors > 0;
     if (!consequence && may_follow(failure))
@@ -223,7 +223,7 @@ bool session::recover_header(const fatal_exit &failure, int new_kind) {
         open_stanza(new_kind, true);
         stanzas[index_of(new_kind)].misplaced = true;
         index_lost = true;
-    } else if (is_message(known, "S118")) {
+    } else if (failure.id == MSG_SECOND_MAP) {
         give_up_map();
     } else {
         skip_stanza();
@@ -242,8 +242,7 @@ void session::give_up_map() {
 
 /* The stanza kind that a line names that is no attribute line: nearly, or in a skipped stanza exactly. */
 std::string_view session::header_meant(const attr_text &text, const fatal_exit &failure) const {
-    const message &known = message_of(failure);
-    bool whole = is_message(known, "S103") || is_message(known, "S102");
+    bool whole = failure.id == MSG_NO_EQUALS || failure.id == MSG_NO_STANZA;
     if (!whole)
         return {};
     return near_miss({text.name, static_cast<size_t>(text.end - text.name)}, stanza_names());
@@ -392,12 +391,11 @@ void session::note_refused(std::optional<int> type) {
 /* Whether a line belongs to another stanza, as one before it did. Notes it if it is the first: a second name, or an
  * attribute that other kinds have and this one has not. */
 bool session::misplaced(const fatal_exit &failure) {
-    const message &known = message_of(failure);
-    bool unknown = is_message(known, "S106") && !type_meant();
-    bool repeated = is_message(known, "S109");
+    bool unknown = failure.id == MSG_UNKNOWN_ATTRIBUTE && !type_meant();
+    bool repeated = failure.id == MSG_REPEATED_ATTRIBUTE;
     bool &before = stanzas[index_of(kind)].misplaced;
     if (before)
-        return unknown || repeated || is_message(known, "S207") || is_message(known, "S208");
+        return unknown || repeated || failure.id == MSG_INVALID_VALUE || failure.id == MSG_NO_VALID_VALUE;
     bool named = repeated && (cx.latest.attr == cx.scp->sc_attrs.data() || is_name(name_given()));
     vx_uint32_t kinds = unknown || named ? kinds_with(name_given()) : 0;
     before = kinds != 0;
@@ -430,18 +428,17 @@ void session::lose_first_header(const attr_text &text, const fatal_exit &failure
 
 /* Whether an attribute's error is a consequence of one that has been told. */
 bool session::attribute_follows(const fatal_exit &failure) {
-    const message &known = message_of(failure);
-    if (is_message(known, "S210"))
+    if (failure.id == MSG_INDEX_NOT_CONSECUTIVE)
         return index_lost || (other_index >= 0 && cx.curr_sdeli == other_index);
-    if (is_message(known, "S117"))
+    if (failure.id == MSG_NO_STRING_TABLE)
         return told_otherwise(failure);
     const stanza_note &stanza = stanzas[index_of(kind)];
     bool typed = cx.latest.attr != nullptr && is_typed(cx.latest.attr->ta_type);
     bool untyped = cx.state->broken && cx.scp->dt_offset >= 0 && data_type(cx) == VX_UNKNOWN;
-    if (typed && untyped && is_message(known, "S207"))
+    if (typed && untyped && failure.id == MSG_INVALID_VALUE)
         return true;
     bool value_refused = stanza.refused.has_any({AT_VALID_VALUE, AT_SD_VALID_VALUE}) || stanza.refused.unknown_name;
-    if (is_message(known, "S208") && value_refused)
+    if (failure.id == MSG_NO_VALID_VALUE && value_refused)
         return true;
     return misplaced(failure);
 }
@@ -463,20 +460,19 @@ void session::tell_instead(warning_id id, int at_line) {
 
 /* What else the error of an attribute leaves to be done, besides its stanza's being broken. */
 void session::recover_value(const fatal_exit &failure, bool follows) {
-    const message &known = message_of(failure);
-    if (is_message(known, "S210")) {
+    if (failure.id == MSG_INDEX_NOT_CONSECUTIVE) {
         if (!follows)
             tell_instead(INCOMPLETE, index_missing);
         recover_index(follows);
     }
-    if (is_message(known, "S117"))
+    if (failure.id == MSG_NO_STRING_TABLE)
         forge_class();
-    if (is_sd_kind(kind) && is_message(known, "S207") && data_type(cx) == VX_UNKNOWN)
+    if (is_sd_kind(kind) && failure.id == MSG_INVALID_VALUE && data_type(cx) == VX_UNKNOWN)
         tell_type();
 }
 
 void session::recover_attribute(const fatal_exit &failure) {
-    const message &known = message_of(failure);
+    const message &known = message_of(failure.id);
     if (std::string_view meant = header_meant(line, failure); !meant.empty())
         return indented_header(meant, failure);
     if (kind < 0)
@@ -489,7 +485,7 @@ void session::recover_attribute(const fatal_exit &failure) {
     overflow_told = false;
     recover_value(failure, follows);
     cx.state->broken = true;
-    if (is_message(known, "S108"))
+    if (failure.id == MSG_OPTIONAL_TOO_EARLY)
         take_quietly(std::string_view(raw).substr(0, all_of_line().column - 1 + all_of_line().length));
     else
         note_refused(cx.latest.attr == nullptr ? type_meant() : std::optional(cx.latest.attr->ta_type));
@@ -508,7 +504,7 @@ bool session::recover_end(const fatal_exit &failure) {
     bool told = failed >= 0 && cx.stanzas[index_of(failed)].broken;
     if (!told && !told_otherwise(failure) && may_follow(failure)) {
         add_notes(error(failure, here(mark_kind::none)), failure, failed);
-        if (is_message(message_of(failure), "S304") && map_value("LastKey") == nullptr)
+        if (failure.id == MSG_KEYS_REVERSED && map_value("LastKey") == nullptr)
             tell_instead(INCOMPLETE, map_line);
     }
     if (failed >= 0)

@@ -16,10 +16,10 @@ namespace {
 
 constexpr const char *CLASS_NAME = "class.cdef"; /* what a compilation would name it after is not known: a good name */
 
-std::string words_of(const fatal_exit &failure) {
-    std::string text = failure.msg;
-    for (const char *detail : {failure.detail1, failure.detail2})
-        text += detail == nullptr ? "" : detail;
+std::string text_of(const fatal_exit &failure) {
+    std::string text;
+    for (const char *part : words_of(failure))
+        text += part;
     return text;
 }
 
@@ -35,13 +35,13 @@ session::session(const std::string &path, const warning_set &wanted_warnings, re
 /* ---- Findings ------------------------------------------------------------------------------------------------- */
 
 finding &session::error(const fatal_exit &failure, const place &at) {
-    const message &known = message_of(failure);
+    const message &known = message_of(failure.id);
     if (known.whose == blame::surroundings)
-        throw trouble(out.file + ": " + words_of(failure));
+        throw trouble(out.file + ": " + text_of(failure));
     out.findings.push_back({.error = true,
                             .code = known.code,
                             .name = "error",
-                            .text = words_of(failure),
+                            .text = text_of(failure),
                             .at = at,
                             .source = raw,
                             .notes = {}});
@@ -90,8 +90,8 @@ place session::here(mark_kind what, const fatal_exit *failure) const {
         return all;
     if (what == mark_kind::name)
         return {cx.linenum, all.column, equals - (all.column - 1)};
-    if (what == mark_kind::item && failure != nullptr && failure->msg >= line.line && failure->msg < line.end)
-        return {cx.linenum, static_cast<size_t>(failure->msg - line.line) + 1, strlen(failure->msg)};
+    if (what == mark_kind::item && failure != nullptr && failure->detail1 >= line.line && failure->detail1 < line.end)
+        return {cx.linenum, static_cast<size_t>(failure->detail1 - line.line) + 1, strlen(failure->detail1)};
     if (cx.latest.attr != nullptr && cx.latest.length > 0)
         return value_part(0, cx.latest.length);
     return {cx.linenum, equals + 2, all.column - 1 + all.length - (equals + 1)};
@@ -188,7 +188,7 @@ void session::run() {
             take(source);
         }
     } catch (const fatal_exit &failure) {
-        throw trouble(words_of(failure));
+        throw trouble(text_of(failure));
     }
     cx.cdb_fp.close();
     close_all();

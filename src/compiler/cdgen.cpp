@@ -26,7 +26,7 @@ void parse_options(cdgen &cx, int argc, char **argv) {
             cx.swap_endianness = 1;
             break;
         default: /* getopt has complained: nothing else is to be printed */
-            throw fatal_exit{nullptr, nullptr, nullptr, 0, 1};
+            throw fatal_exit{NO_MESSAGE, nullptr, nullptr, 0, 1};
         }
     }
 }
@@ -35,11 +35,11 @@ void parse_options(cdgen &cx, int argc, char **argv) {
 void parse_command_line(cdgen &cx, int argc, char **argv) {
     parse_options(cx, argc, argv);
     if (optind >= argc)
-        cdgen_error_exit(cx, "Usage: ", argv[0],
+        cdgen_error_exit(MSG_USAGE, argv[0],
                          " [-s] cdefsrc_filename cdef_filename\n    -s Reverse endianness of CDB.\n", 0, 1);
     cx.cdefsrc = argv[optind++];
     if (optind >= argc)
-        cdgen_error_exit(cx, "usage: ", argv[0], " cdefsrc_filename cdef_filename", 0, 1);
+        cdgen_error_exit(MSG_USAGE_NO_OUTPUT, argv[0], " cdefsrc_filename cdef_filename", 0, 1);
     cx.cdefname = argv[optind];
 }
 
@@ -65,7 +65,7 @@ void drop_values(cdgen &cx) {
 vx_uint16_t locator_id(cdgen &cx) {
     tbl *strings = sc_tables[SC_PERSISTENT_RESOURCE_ATTRIBUTE].sc_str_tbl(cx);
     for (const rsrc_pattr_t &attr : records_of<rsrc_pattr_t>(staged_tbl(cx.cb_rsrc_class.u_rc_pattrs))) {
-        const auto *name = static_cast<const char *>(tbl_at(cx, strings, attr.u_ra_name.offset[0], 1));
+        const auto *name = static_cast<const char *>(tbl_at(strings, attr.u_ra_name.offset[0], 1));
         if (strcmp(name, cx._rc_locator.name) == 0)
             return static_cast<vx_uint16_t>(attr.ra_attr_id);
     }
@@ -80,7 +80,7 @@ void resolve_locator(cdgen &cx) {
 /* There is no stanza for the manager: it is made of its name. */
 void make_manager(cdgen &cx) {
     if (cx.rm_name == nullptr)
-        cdgen_error_exit(cx, "No resource manager defined", nullptr, nullptr, 0, 1);
+        cdgen_error_exit(MSG_NO_MANAGER, nullptr, nullptr, 0, 1);
     init_mgr_tbl(cx);
     tbl *strings = staged_tbl(cx.cb_rsrc_mgr.u_rm_strings_table);
     const char *name = cx.rm_name.get();
@@ -90,13 +90,13 @@ void make_manager(cdgen &cx) {
 
 void complete_class(cdgen &cx) {
     if (cx.cb_rsrc_class.rc_cb_ID == 0)
-        cdgen_error_exit(cx, "No classes defined", nullptr, nullptr, 0, 1);
+        cdgen_error_exit(MSG_NO_CLASSES, nullptr, nullptr, 0, 1);
     cmplt_class_tbl(cx);
 }
 
 void complete_map(cdgen &cx) {
     if (cx.cb_rsrc_cmmap.rcm_cb_ID == 0)
-        cdgen_error_exit(cx, "No class-to-manager maps defined", nullptr, nullptr, 0, 1);
+        cdgen_error_exit(MSG_NO_MAPS, nullptr, nullptr, 0, 1);
     cmplt_cmmap_tbl(cx);
 }
 
@@ -118,22 +118,17 @@ constexpr closing_step steps[] = {
     bld_var_id_tbls,
 };
 
-const char *text_or_none(const char *text) {
-    return text == nullptr ? "" : text;
-}
-
 /* Traces come first: some explain the message. */
 int report(const cdgen &cx, const fatal_exit &failure) {
     fflush(stdout);
-    if (failure.msg == nullptr)
+    if (failure.id == NO_MESSAGE)
         return failure.code;
     const char *end = cx.interactive ? "\n" : "";
-    const char *detail1 = text_or_none(failure.detail1);
-    const char *detail2 = text_or_none(failure.detail2);
+    auto [first, second, third] = words_of(failure);
     if (failure.line != 0)
-        fprintf(stderr, "%d: %s%s%s%s", failure.line, failure.msg, detail1, detail2, end);
+        fprintf(stderr, "%d: %s%s%s%s", failure.line, first, second, third, end);
     else
-        fprintf(stderr, "%s%s%s%s", failure.msg, detail1, detail2, end);
+        fprintf(stderr, "%s%s%s%s", first, second, third, end);
     return failure.code;
 }
 
@@ -146,17 +141,6 @@ cdgen::~cdgen() {
     set_unfinished_output(nullptr);
     for (tbl_content &content : filed)
         free(content.tbl_base);
-}
-
-void cdgen_error_exit(cdgen &cx, const char *msg, const char *detail1, const char *detail2, int line, int code) {
-    if (!cx.checking)
-        cx.cdb_fp.close();
-    discard_mapfile(cx);
-    throw fatal_exit{msg, detail1, detail2, line, code};
-}
-
-void source_error(cdgen &cx, const char *msg, const char *detail1, const char *detail2) {
-    cdgen_error_exit(cx, msg, detail1, detail2, cx.linenum, 1);
 }
 
 void compile(cdgen &cx) {
@@ -175,6 +159,6 @@ int cdgen_main(int argc, char **argv) {
     } catch (const fatal_exit &failure) {
         return report(cx, failure);
     } catch (const std::bad_alloc &) { /* of the standard library's containers */
-        return report(cx, {"cfg_malloc malloc failure: ", strerror(ENOMEM), nullptr, 0, ENOMEM});
+        return report(cx, {MSG_OUT_OF_MEMORY, strerror(ENOMEM), nullptr, 0, ENOMEM});
     }
 }

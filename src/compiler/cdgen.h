@@ -6,6 +6,7 @@
 #define CDGEN_CDGEN_H
 
 #include "cdb.h"
+#include "compiler/cdgen_error.h"
 #include "format/names.h"
 #include "language/name_index.h"
 
@@ -69,7 +70,7 @@ constexpr size_t round8(size_t n) {
 }
 
 /* Zero-filled memory, to be given back with free(). Failing is fatal, with errno as the status. */
-void *cfg_malloc(cdgen &cx, size_t s);
+void *cfg_malloc(size_t s);
 
 /* A new, empty table that stays until it is filed, or as long as the context. */
 tbl *make_tbl(cdgen &cx, size_t au, const char *name);
@@ -95,10 +96,10 @@ void memcpy_8_rounded(char *dst, const char *src, int len);
 
 /* The record at an offset of a staging table, valid until the next reservation in it. An offset that leads out of the
  * used part is a defect of the program and fatal. Offsets of records are multiples of their alignment. */
-void *tbl_at(cdgen &cx, tbl_content *t, size_t offset, size_t size);
+void *tbl_at(tbl_content *t, size_t offset, size_t size);
 
-template <class Record> Record *record_at(cdgen &cx, tbl_content *t, size_t offset) {
-    return static_cast<Record *>(tbl_at(cx, t, offset, sizeof(Record)));
+template <class Record> Record *record_at(tbl_content *t, size_t offset) {
+    return static_cast<Record *>(tbl_at(t, offset, sizeof(Record)));
 }
 
 /* All records of a table that holds nothing else. */
@@ -184,7 +185,7 @@ char *strip_quotes(char *s);
 char *strip_quotes(char *s, char **end);
 /* ORs the bits of the properties named in a comma-separated list, which it takes apart, into *dest. An unknown name is
  * fatal. */
-void set_props(cdgen &cx, vx_uint32_t *dest, const props_t *props, int len, char *vnoq);
+void set_props(vx_uint32_t *dest, const props_t *props, int len, char *vnoq);
 /* Packs up to four dotted numbers into *n; always 0. */
 int ver_str_convert(cdgen &cx, const char *ver_str, vx_uint32_t *n);
 /* Ends the text at its first comma and returns what follows; null without a comma. */
@@ -378,16 +379,6 @@ struct stanza_state {
 
 /* ---- The compilation ------------------------------------------------------------------------------------------- */
 
-/* How a compilation ends early: the one exception, from the fatal exits to the driver. The texts are literals, stand in
- * the context, or belong to the caller of the compilation. */
-struct fatal_exit {
-    const char *msg;
-    const char *detail1; /* may be null */
-    const char *detail2; /* may be null */
-    int line;            /* 0: none */
-    int code;            /* exit status */
-};
-
 constexpr size_t SOURCE_BUFFER = 65536; /* bytes asked for by one read */
 
 /* The source while it is read; closes itself. */
@@ -555,16 +546,6 @@ struct cdgen {
     void *cdb_mapfile_ptr = nullptr;
     size_t gross_file_size = 0; /* bytes pre-filled and mapped */
 };
-
-/* End the compilation: no return. cdgen_error_exit closes the source; bld_error_exit removes the output file once that
- * has been mapped. Details may be null. */
-[[noreturn]] void cdgen_error_exit(cdgen &cx, const char *msg, const char *detail1, const char *detail2, int line,
-                                   int code);
-[[noreturn]] void bld_error_exit(cdgen &cx, const char *msg, const char *detail1, const char *detail2, int code);
-
-/* The usual case: a message about the current line, status 1. */
-[[noreturn]] void source_error(cdgen &cx, const char *msg, const char *detail1 = nullptr,
-                               const char *detail2 = nullptr);
 
 /* ---- Phases, in their order ------------------------------------------------------------------------------------ */
 

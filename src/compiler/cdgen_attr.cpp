@@ -23,17 +23,17 @@ name_value split_line(cdgen &cx, const attr_text &text) {
         return {};
     auto *equals = static_cast<char *>(memchr(name, '=', static_cast<size_t>(end - name)));
     if (equals == nullptr)
-        source_error(cx, "Missing '=' after attribute name");
+        source_error(cx, MSG_NO_EQUALS);
     *equals = '\0';
     char *value = equals + 1;
     if (value[0] == '"' && value[1] == '"' && value[2] == '\0')
         return {};
     char *unquoted = strip_quotes(value, &end);
     if (unquoted == nullptr)
-        source_error(cx, "Unmatched double quotes for attribute: ", name);
+        source_error(cx, MSG_UNMATCHED_QUOTES, name);
     auto length = static_cast<size_t>(end - unquoted);
     if (length > VALUE_MAX_CHARS)
-        source_error(cx, "Attibute value exceeds maximum length: ", name); /* deliberately spelled so */
+        source_error(cx, MSG_VALUE_TOO_LONG, name);
     cx.linepos = 1 + static_cast<int>(unquoted - text.line);
     return {{name, static_cast<size_t>(equals - name)}, unquoted, length};
 }
@@ -41,23 +41,22 @@ name_value split_line(cdgen &cx, const attr_text &text) {
 const table_attrs &known_attr(cdgen &cx, const srtable_ctrl &scp, std::string_view name) {
     const table_attrs *attr = find_attr(scp, name);
     if (attr == nullptr)
-        source_error(cx, "Attribute name not defined in table (name/table): ", name.data(), scp.sc_name);
+        source_error(cx, MSG_UNKNOWN_ATTRIBUTE, name.data(), scp.sc_name);
     return *attr;
 }
 
 /* Optional attributes follow the required ones; most may stand once. */
 void count_optional(cdgen &cx, const srtable_ctrl &scp, stanza_state &state, const table_attrs &attr) {
     if (state.req_mask != scp.req_mask_cmplt && !state.broken)
-        source_error(cx, "Optional attribute discovered before all required attributes have been defined",
-                     attr.ta_name);
+        source_error(cx, MSG_OPTIONAL_TOO_EARLY, attr.ta_name);
     if ((state.opt_mask & attr.req_bit & ~OPTIONAL) != 0 && !attr.dup_allowed)
-        source_error(cx, "Already defined. Duplicated definitions not allowed for ", attr.ta_name);
+        source_error(cx, MSG_REPEATED_ATTRIBUTE, attr.ta_name);
     state.opt_mask |= attr.req_bit;
 }
 
 void count_required(cdgen &cx, stanza_state &state, const table_attrs &attr) {
     if ((state.req_mask & attr.req_bit) != 0 && !attr.dup_allowed)
-        source_error(cx, "Already defined. Duplicated definitions not allowed for ", attr.ta_name);
+        source_error(cx, MSG_REPEATED_ATTRIBUTE, attr.ta_name);
     state.req_mask |= attr.req_bit;
     if (cx.debugLevel >= 2)
         printf("Added %x to mask, which is now %x\n", attr.req_bit, state.req_mask);
@@ -80,7 +79,7 @@ void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, s
     if (*value == '\0') {
         if (!cx.checking)
             printf("In file %s: ", cx.cdefsrc);
-        source_error(cx, "Missing attribute value: ", attr.ta_name);
+        source_error(cx, MSG_NO_VALUE, attr.ta_name);
     }
     if (cx.debugLevel >= 2)
         printf("%s: found attr: \"%s\", value: \"%s\",length: %d\n", scp.sc_name, attr.ta_name, value,

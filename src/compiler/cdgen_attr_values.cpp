@@ -35,7 +35,7 @@ vx_data_type_t data_type(const attr_line &line) {
 tbl *strings_of(const attr_line &line) {
     tbl *strings = line.scp.sc_str_tbl(line.cx);
     if (strings == nullptr)
-        source_error(line.cx, "No tbl for strings table");
+        source_error(line.cx, MSG_NO_STRING_TABLE);
     return strings;
 }
 
@@ -52,7 +52,7 @@ void store_string(const attr_line &line) {
 
 void store_props(const attr_line &line, const props_t *props, int count) {
     auto bits = load<vx_uint32_t>(field_of(line));
-    set_props(line.cx, &bits, props, count, line.value);
+    set_props(&bits, props, count, line.value);
     store(field_of(line), bits);
 }
 
@@ -95,7 +95,7 @@ void store_permission(const attr_line &line) {
 void store_variable_type(const attr_line &line) {
     orb_variable_type_t type = ORB_COUNTER;
     if (strToVar(line.value, &type) != 0)
-        source_error(line.cx, "Invalid variable type");
+        source_error(line.cx, MSG_INVALID_VARIABLE_TYPE);
     store(field_of(line), type);
 }
 
@@ -104,10 +104,10 @@ void store_manager(const attr_line &line) {
     cdgen &cx = line.cx;
     store(field_of(line), vx_uint16_t{0});
     if (cx.rm_name != nullptr)
-        cdgen_error_exit(cx, "Resource manager already defined: ", cx.rm_name.get(), nullptr, 0, 1);
+        cdgen_error_exit(MSG_SECOND_MANAGER, cx.rm_name.get(), nullptr, 0, 1);
     cx.rm_name.reset(strdup(line.value));
     if (cx.rm_name == nullptr)
-        cdgen_error_exit(cx, "strdup failed: ", strerror(errno), nullptr, 0, errno);
+        cdgen_error_exit(MSG_NO_MEMORY_FOR_NAME, strerror(errno), nullptr, 0, errno);
 }
 
 void store_locator(const attr_line &line) {
@@ -128,7 +128,7 @@ char *after_comma(const attr_line &line) {
  * the table, which is where the list ends. */
 template <class List>
 size_t next_entry(cdgen &cx, tbl *t, size_t list, vx_uint32_t List::*count, size_t first, size_t size) {
-    if (record_at<List>(cx, t, list)->*count == 0)
+    if (record_at<List>(t, list)->*count == 0)
         return list + first;
     auto *entry = static_cast<char *>(alloc_tble(cx, t, size));
     return static_cast<size_t>(entry - t->tbl_base);
@@ -137,7 +137,7 @@ size_t next_entry(cdgen &cx, tbl *t, size_t list, vx_uint32_t List::*count, size
 void store_variety(const attr_line &line) {
     char *high = after_comma(line);
     if (high == nullptr)
-        source_error(line.cx, "Incorrect variety format");
+        source_error(line.cx, MSG_INVALID_VARIETY);
     tbl *varieties = line.scp.sc_vty_tbl(line.cx);
     auto list = load<vx_uint32_t>(field_of(line));
     size_t at = next_entry(line.cx, varieties, list, &variety_list_t::vl_count, offsetof(variety_list_t, vl_values),
@@ -145,30 +145,29 @@ void store_variety(const attr_line &line) {
     char *rest = nullptr;
     auto high_val = static_cast<vx_uint32_t>(int_from_text(line.cx, high, &rest, 0));
     if (*rest != '\0' && strchr(rest, ',') != nullptr)
-        source_error(line.cx, "Too many varieties");
+        source_error(line.cx, MSG_TOO_MANY_VARIETIES);
     auto low_val = static_cast<vx_uint32_t>(integer(line, line.value));
-    *record_at<vl_entry_t>(line.cx, varieties, at) = {low_val, high_val};
-    ++record_at<variety_list_t>(line.cx, varieties, list)->vl_count;
+    *record_at<vl_entry_t>(varieties, at) = {low_val, high_val};
+    ++record_at<variety_list_t>(varieties, list)->vl_count;
 }
 
 /* Converts a text to a value that waits in the line's pool. */
 vx_value_t converted(const attr_line &line, vx_data_type_t type, const char *text) {
     vx_value_t value = {};
     if (str_to_vx(line.cx, &value, type, text, line.cx.line_texts) != 0)
-        source_error(line.cx, "str_to_vx: Invalid data");
+        source_error(line.cx, MSG_INVALID_VALUE);
     return value;
 }
 
 /* Serialises a value into a cell, with an array of its own if it is one. */
-void copied(const attr_line &line, vx_value_t *cell, const vx_value_t &value, vx_data_type_t type,
-            const char *failure) {
+void copied(const attr_line &line, vx_value_t *cell, const vx_value_t &value, vx_data_type_t type, message_id failure) {
     tbl_anchor array;
     if (copy_this_type(line.cx, cell, &value, type, TYPE_SAME, strings_of(line), &array, 1) != 0)
         source_error(line.cx, failure);
 }
 
-constexpr const char *COPY_ERROR = "copy_this_type error";
-constexpr const char *DATA_ERROR = "str_to_vx: Invalid data";
+constexpr message_id COPY_ERROR = MSG_COPY_FAILED;
+constexpr message_id DATA_ERROR = MSG_INVALID_VALUE;
 
 /* With a comma, high then low; without one, one value that is written twice, low then high. */
 void store_bounds(const attr_line &line, vx_data_type_t type, vv_entry_t *entry) {
@@ -191,9 +190,9 @@ void add_valid_value(const attr_line &line) {
         next_entry(cx, lists, list, &valid_values_t::vv_count, offsetof(valid_values_t, vv_values), sizeof(vv_entry_t));
     vv_entry_t entry = {};
     store_bounds(line, scalar_vx(data_type(line)), &entry);
-    *record_at<vv_entry_t>(cx, lists, at) = entry;
+    *record_at<vv_entry_t>(lists, at) = entry;
     cx.vvdisp = at + offsetof(vv_entry_t, vv_disp_msgid);
-    ++record_at<valid_values_t>(cx, lists, list)->vv_count;
+    ++record_at<valid_values_t>(lists, list)->vv_count;
 }
 
 void store_valid_value(const attr_line &line) {
@@ -208,9 +207,8 @@ void store_valid_value(const attr_line &line) {
 void store_value_display(const attr_line &line) {
     cdgen &cx = line.cx;
     if (!cx.vvdisp.has_value())
-        source_error(cx, "No ValidValue to attach ValueDisplayName to.");
-    *record_at<vx_uint16_t>(cx, line.scp.sc_vv_tbl(cx), *cx.vvdisp) =
-        static_cast<vx_uint16_t>(integer(line, line.value));
+        source_error(cx, MSG_NO_VALID_VALUE);
+    *record_at<vx_uint16_t>(line.scp.sc_vv_tbl(cx), *cx.vvdisp) = static_cast<vx_uint16_t>(integer(line, line.value));
 }
 
 /* ---- Data types, defaults and ranges --------------------------------------------------------------------------- */
@@ -231,14 +229,14 @@ void store_default(const attr_line &line) {
     cdgen &cx = line.cx;
     vx_data_type_t type = data_type(line);
     if (is_sd(type))
-        source_error(cx, "Default values not expected; place default values in individual *SDDef stanzas.");
+        source_error(cx, MSG_SD_DEFAULT);
     dflt_tbl &dflt = line.state.dflt;
     if (dflt.tbl == nullptr)
         dflt.tbl = new_dflt_values(cx, "DefaultValues");
     void *slot = alloc_tble(cx, &dflt.tbl->cells, sizeof(vx_value_t));
     vx_value_t value = {};
     if (str_to_vx(cx, &value, type, line.value, dflt.tbl->texts) != 0)
-        source_error(cx, "str_to_vx: Invalid data");
+        source_error(cx, MSG_INVALID_VALUE);
     memcpy(slot, &value, sizeof value);
     ++dflt.num_elems;
 }
@@ -258,7 +256,7 @@ void store_data_type(const attr_line &line) {
     vx_data_type_t type = strToVxDt(line.value);
     store(field_of(line), type);
     if (type == VX_UNKNOWN)
-        source_error(line.cx, "Invalid data type");
+        source_error(line.cx, MSG_INVALID_DATA_TYPE);
     if (is_sd(type))
         expect_sd_run(line, type);
 }
@@ -279,7 +277,7 @@ void store_range(const attr_line &line) {
     cx.dattr_range_found = 1;
     char *max = after_comma(line);
     if (max == nullptr)
-        source_error(cx, "Range requires two values");
+        source_error(cx, MSG_RANGE_NEEDS_TWO);
     bool of_resource = cx.cb_rsrc_dattr.ra_cb_ID != 0;
     rsrc_dattr_t &target = of_resource ? cx.cb_rsrc_dattr : cx.cb_rsrc_dattrC;
     if (of_resource)
@@ -315,7 +313,7 @@ void check_sd_index(const attr_line &line) {
     if (cx.curr_sdeli != cx.expected_sdeli) {
         if (!cx.checking)
             printf("curr_sdel = %d, expected_sdeli = %d\n", cx.curr_sdeli, cx.expected_sdeli);
-        source_error(cx, "ElementIndeces must be consecutive");
+        source_error(cx, MSG_INDEX_NOT_CONSECUTIVE);
     }
     cx.expected_sdeli = static_cast<int>(static_cast<unsigned>(cx.curr_sdeli) + 1);
 }
@@ -325,7 +323,7 @@ void store_sd_data_type(const attr_line &line) {
     cdgen &cx = line.cx;
     vx_data_type_t type = strToVxDt(line.value);
     if (is_sd(type))
-        source_error(cx, "SD elements cannot be of SD type");
+        source_error(cx, MSG_SD_IN_SD);
     store(field_of(line), type);
     cx.sd_dt_found = 1;
     if (cx.attr_dflt_val == nullptr)
@@ -346,7 +344,7 @@ void store_sd_valid_value(const attr_line &line) {
 }
 
 void refuse_sd_default(const attr_line &line) {
-    source_error(line.cx, "Sorry, default SD values are not yet supported");
+    source_error(line.cx, MSG_ELEMENT_DEFAULT);
 }
 
 using handler = void (*)(const attr_line &);
@@ -391,6 +389,6 @@ constexpr std::array<handler, AT_COUNT> handlers = {
 
 void store_value(const attr_line &line) {
     if (line.attr.ta_type < 0 || line.attr.ta_type >= AT_COUNT)
-        source_error(line.cx, "Unknown attribute");
+        source_error(line.cx, MSG_UNKNOWN_ATTRIBUTE_TYPE);
     handlers[static_cast<size_t>(line.attr.ta_type)](line);
 }

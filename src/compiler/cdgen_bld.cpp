@@ -28,47 +28,45 @@ size_t used_bytes(const cdb_ref_t &table) {
 /* ---- Sizes ----------------------------------------------------------------------------------------------------- */
 
 /* Offsets and sizes in the file have 32 bits. */
-vx_uint32_t checked_size(cdgen &cx, size_t bytes) {
+vx_uint32_t checked_size(size_t bytes) {
     if (bytes > std::numeric_limits<vx_uint32_t>::max())
-        bld_error_exit(cx, "A table or section is too large for the database (4294967295 bytes at most)", nullptr,
-                       nullptr, 1);
+        bld_error_exit(MSG_TABLE_TOO_LARGE, nullptr, nullptr, 1);
     return static_cast<vx_uint32_t>(bytes);
 }
 
 /* Counts have 16. */
-vx_uint16_t checked_count(cdgen &cx, const cdb_ref_t &table, size_t record) {
+vx_uint16_t checked_count(const cdb_ref_t &table, size_t record) {
     size_t count = used_bytes(table) / record;
     if (count > std::numeric_limits<vx_uint16_t>::max())
-        bld_error_exit(cx, "Too many records of one kind in a class (65535 at most): ", staged_content(table)->tbl_name,
-                       nullptr, 1);
+        bld_error_exit(MSG_TOO_MANY_RECORDS, staged_content(table)->tbl_name, nullptr, 1);
     return static_cast<vx_uint16_t>(count);
 }
 
-size_t strings_size(cdgen &cx, const cdb_ref_t &strings) {
-    return round8(checked_size(cx, used_bytes(strings)));
+size_t strings_size(const cdb_ref_t &strings) {
+    return round8(checked_size(used_bytes(strings)));
 }
 
 /* Errors, dependencies and structured byte strings are deliberately not counted. */
-size_t class_size(cdgen &cx, rsrc_class_t &rc) {
-    rc.rc_num_pattrsC = checked_count(cx, rc.u_rc_pattrsC, sizeof(rsrc_pattr_t));
-    rc.rc_num_pattrs = checked_count(cx, rc.u_rc_pattrs, sizeof(rsrc_pattr_t));
-    rc.rc_num_dattrsC = checked_count(cx, rc.u_rc_dattrsC, sizeof(rsrc_dattr_t));
-    rc.rc_num_dattrs = checked_count(cx, rc.u_rc_dattrs, sizeof(rsrc_dattr_t));
-    rc.rc_sd_size = checked_size(cx, used_bytes(rc.u_rc_sd_defs));
-    rc.rc_num_actionsC = checked_count(cx, rc.u_rc_actionsC, sizeof(rsrc_action_t));
-    rc.rc_num_actions = checked_count(cx, rc.u_rc_actions, sizeof(rsrc_action_t));
-    rc.rc_varlist_size = checked_size(cx, used_bytes(rc.u_rc_variety_lists));
-    rc.rc_valval_size = checked_size(cx, used_bytes(rc.u_rc_valid_vals));
+size_t class_size(rsrc_class_t &rc) {
+    rc.rc_num_pattrsC = checked_count(rc.u_rc_pattrsC, sizeof(rsrc_pattr_t));
+    rc.rc_num_pattrs = checked_count(rc.u_rc_pattrs, sizeof(rsrc_pattr_t));
+    rc.rc_num_dattrsC = checked_count(rc.u_rc_dattrsC, sizeof(rsrc_dattr_t));
+    rc.rc_num_dattrs = checked_count(rc.u_rc_dattrs, sizeof(rsrc_dattr_t));
+    rc.rc_sd_size = checked_size(used_bytes(rc.u_rc_sd_defs));
+    rc.rc_num_actionsC = checked_count(rc.u_rc_actionsC, sizeof(rsrc_action_t));
+    rc.rc_num_actions = checked_count(rc.u_rc_actions, sizeof(rsrc_action_t));
+    rc.rc_varlist_size = checked_size(used_bytes(rc.u_rc_variety_lists));
+    rc.rc_valval_size = checked_size(used_bytes(rc.u_rc_valid_vals));
     return sizeof rc + sizeof(rsrc_pattr_t) * (size_t{rc.rc_num_pattrs} + rc.rc_num_pattrsC) +
            sizeof(rsrc_dattr_t) * (size_t{rc.rc_num_dattrs} + rc.rc_num_dattrsC) + rc.rc_sd_size +
            sizeof(rsrc_action_t) * (size_t{rc.rc_num_actionsC} + rc.rc_num_actions) + rc.rc_varlist_size +
-           rc.rc_valval_size + strings_size(cx, rc.u_rc_strings);
+           rc.rc_valval_size + strings_size(rc.u_rc_strings);
 }
 
 /* ---- The output file ------------------------------------------------------------------------------------------- */
 
-[[noreturn]] void cannot(cdgen &cx, const char *what, int error) {
-    bld_error_exit(cx, what, strerror(error), nullptr, 1);
+[[noreturn]] void cannot(message_id what, int error) {
+    bld_error_exit(what, strerror(error), nullptr, 1);
 }
 
 /* A descriptor that is closed unless it is handed on. */
@@ -99,9 +97,9 @@ void refuse_own_files(cdgen &cx) {
     if (stat(cx.cdefname, &st) != 0)
         return;
     if (st.st_dev == cx.cdb_fp.device && st.st_ino == cx.cdb_fp.inode)
-        bld_error_exit(cx, "Cannot create CDB file: ", "it is the source file", nullptr, 1);
+        bld_error_exit(MSG_CANNOT_CREATE, "it is the source file", nullptr, 1);
     if (cx.debugLevel > 0 && (is_stream(st, STDOUT_FILENO) || is_stream(st, STDERR_FILENO)))
-        bld_error_exit(cx, "Cannot create CDB file: ", "traces go there", nullptr, 1);
+        bld_error_exit(MSG_CANNOT_CREATE, "traces go there", nullptr, 1);
 }
 
 /* Emptied only once it is known not to be a file that the program uses. */
@@ -110,18 +108,18 @@ int create_output(cdgen &cx) {
     struct stat st = {};
     output_fd out(above_stdio(open(cx.cdefname, O_RDWR | O_CREAT | O_CLOEXEC, 0644)));
     if (out.fd < 0)
-        cannot(cx, "Cannot create CDB file: ", errno);
+        cannot(MSG_CANNOT_CREATE, errno);
     if (fstat(out.fd, &st) != 0)
-        cannot(cx, "Cannot map CDB file: ", errno);
+        cannot(MSG_CANNOT_MAP, errno);
     if (S_ISREG(st.st_mode))
         set_unfinished_output(cx.cdefname);
     if (S_ISREG(st.st_mode) && st.st_size > 0 && ftruncate(out.fd, 0) != 0)
-        cannot(cx, "Cannot create CDB file: ", errno);
+        cannot(MSG_CANNOT_CREATE, errno);
     return out.release();
 }
 
 /* Writes 1024-byte zero blocks until there are at least size bytes, many of them at a time. */
-size_t prefill(cdgen &cx, int fd, size_t size) {
+size_t prefill(int fd, size_t size) {
     constexpr size_t BLOCKS_AT_ONCE = 512;
     static std::array<char, PREFILL_BLOCK> zeros;
     std::array<iovec, BLOCKS_AT_ONCE> blocks;
@@ -135,7 +133,7 @@ size_t prefill(cdgen &cx, int fd, size_t size) {
         if (n < 0 && errno == EINTR)
             continue;
         if (n <= 0)
-            cannot(cx, "Cannot create CDB file: ", n < 0 ? errno : ENOSPC);
+            cannot(MSG_CANNOT_CREATE, n < 0 ? errno : ENOSPC);
         written += static_cast<size_t>(n);
     }
     return gross;
@@ -146,13 +144,13 @@ char *get_mapfile(cdgen &cx, size_t size) {
     output_fd out(create_output(cx));
     struct stat st = {};
     if (fstat(out.fd, &st) == 0 && !S_ISFIFO(st.st_mode))
-        cx.gross_file_size = prefill(cx, out.fd, size);
+        cx.gross_file_size = prefill(out.fd, size);
     if (fstat(out.fd, &st) != 0)
-        cannot(cx, "Cannot map CDB file: ", errno);
+        cannot(MSG_CANNOT_MAP, errno);
     size_t length = S_ISREG(st.st_mode) ? static_cast<size_t>(st.st_size) : 0;
     void *mapped = mmap(nullptr, length, PROT_READ | PROT_WRITE, MAP_SHARED, out.fd, 0);
     if (mapped == MAP_FAILED)
-        cannot(cx, "Cannot map CDB file: ", errno);
+        cannot(MSG_CANNOT_MAP, errno);
     cx.cdb_mapfile_fd = out.release();
     cx.cdb_mapfile_ptr = mapped;
     return static_cast<char *>(mapped);
@@ -222,7 +220,7 @@ private:
     /* The image has been sized before; only tables that no stanza fills are not counted. */
     void reserve(size_t size) {
         if (size > static_cast<size_t>(cx.chp + cx.gross_file_size - cx.dsp))
-            bld_error_exit(cx, "Image larger than computed - internal error", nullptr, nullptr, 1);
+            bld_error_exit(MSG_IMAGE_TOO_SMALL, nullptr, nullptr, 1);
         cx.dsp += size;
         anchor.cda_length += static_cast<vx_uint32_t>(size);
     }
@@ -312,9 +310,9 @@ void add_var_class(cdgen &cx, const rsrc_variable_class_t &staged) {
 }
 
 /* Adds a section for each record of a staged table. */
-template <class Record, class Add> void add_all(cdgen &cx, tbl *t, const char *missing, Add add) {
+template <class Record, class Add> void add_all(cdgen &cx, tbl *t, message_id missing, Add add) {
     if (t->tbl_base == nullptr)
-        bld_error_exit(cx, missing, nullptr, nullptr, 1);
+        bld_error_exit(missing, nullptr, nullptr, 1);
     for (const Record &record : records_of<Record>(t))
         add(cx, record);
 }
@@ -379,33 +377,33 @@ vx_uint32_t cdb_checksum(const char *image, vx_uint32_t start, vx_uint32_t lengt
 size_t cdb_size(cdgen &cx) {
     size_t size = sizeof(orb_cdb_header_t) + sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.dsect_count);
     for (const auto &vc : records_of<rsrc_variable_class_t>(&cx.rsrc_var_class_tbl))
-        size += sizeof vc + strings_size(cx, vc.u_rvc_string_tbl) + round8(sizeof(var_id_t) * vc.rvc_var_count);
+        size += sizeof vc + strings_size(vc.u_rvc_string_tbl) + round8(sizeof(var_id_t) * vc.rvc_var_count);
     for (const auto &map : records_of<rsrc_cmmap_t>(&cx.rsrc_cmmap_tbl))
-        size += sizeof map + strings_size(cx, map.u_rcm_strings);
+        size += sizeof map + strings_size(map.u_rcm_strings);
     for (auto &rc : records_of<rsrc_class_t>(&cx.rsrc_class_tbl))
-        size += class_size(cx, rc);
+        size += class_size(rc);
     for (const auto &mgr : records_of<rsrc_mgr_t>(&cx.rsrc_mgr_tbl))
-        size += sizeof mgr + strings_size(cx, mgr.u_rm_strings_table);
-    return checked_size(cx, size);
+        size += sizeof mgr + strings_size(mgr.u_rm_strings_table);
+    return checked_size(size);
 }
 
 void add_rsrc_class_tbls(cdgen &cx) {
-    add_all<rsrc_class_t>(cx, &cx.rsrc_class_tbl, "No Rsrc Class Tables found", add_class);
+    add_all<rsrc_class_t>(cx, &cx.rsrc_class_tbl, MSG_NO_CLASS_TABLES, add_class);
     store(cx.chp + offsetof(orb_cdb_header_t, cdb_hdr_max_class_id),
           max_id(&cx.rsrc_class_tbl, &rsrc_class_t::rc_class_id));
 }
 
 void add_rsrc_mgr_tbls(cdgen &cx) {
-    add_all<rsrc_mgr_t>(cx, &cx.rsrc_mgr_tbl, "No Rsrc Manager tables", add_mgr);
+    add_all<rsrc_mgr_t>(cx, &cx.rsrc_mgr_tbl, MSG_NO_MANAGER_TABLES, add_mgr);
     store(cx.chp + offsetof(orb_cdb_header_t, cdb_hdr_max_rm_id), max_id(&cx.rsrc_mgr_tbl, &rsrc_mgr_t::rm_id));
 }
 
 void add_rsrc_cmmap_tbls(cdgen &cx) {
-    add_all<rsrc_cmmap_t>(cx, &cx.rsrc_cmmap_tbl, "No Rsrc CMMAP tables", add_cmmap);
+    add_all<rsrc_cmmap_t>(cx, &cx.rsrc_cmmap_tbl, MSG_NO_MAP_TABLES, add_cmmap);
 }
 
 void add_rsrc_var_class_tbls(cdgen &cx) {
-    add_all<rsrc_variable_class_t>(cx, &cx.rsrc_var_class_tbl, "No Rsrc Variable Class tables", add_var_class);
+    add_all<rsrc_variable_class_t>(cx, &cx.rsrc_var_class_tbl, MSG_NO_VARIABLE_CLASS_TABLES, add_var_class);
 }
 
 size_t fit_image(cdgen &cx) {
@@ -413,7 +411,24 @@ size_t fit_image(cdgen &cx) {
     return cdb_size(cx);
 }
 
+namespace {
+
+/* Removes the output if it is not finished. */
+struct discarding {
+    explicit discarding(cdgen &context) : cx(context) {}
+    discarding(const discarding &) = delete;
+    discarding &operator=(const discarding &) = delete;
+    ~discarding() {
+        discard_mapfile(cx);
+    }
+
+    cdgen &cx;
+};
+
+} // namespace
+
 void bld_cdb(cdgen &cx) {
+    discarding unless_finished(cx);
     cx.chp = get_mapfile(cx, fit_image(cx));
     cx.dsect_anchs = cx.chp + sizeof(orb_cdb_header_t);
     cx.dsect_idx = 0;
@@ -434,9 +449,4 @@ void discard_mapfile(cdgen &cx) {
         munmap(std::exchange(cx.cdb_mapfile_ptr, nullptr), cx.gross_file_size);
     close(std::exchange(cx.cdb_mapfile_fd, 0));
     remove(cx.cdefname);
-}
-
-void bld_error_exit(cdgen &cx, const char *msg, const char *detail1, const char *detail2, int code) {
-    discard_mapfile(cx);
-    throw fatal_exit{msg, detail1, detail2, 0, code};
 }

@@ -78,7 +78,7 @@ void take_ids(cdgen &cx, std::optional<class_index> &index, const rsrc_class_t &
         if (name != CDB_NONE) {
             if (!index)
                 index.emplace(records_of<rsrc_variable_class_t>(&cx.rsrc_var_class_tbl));
-            add_varID_to_var_class(cx, *index, static_cast<const char *>(tbl_at(cx, strings, name, 1)),
+            add_varID_to_var_class(cx, *index, static_cast<const char *>(tbl_at(strings, name, 1)),
                                    static_cast<var_id_t>(attr.ra_attr_id) | mark);
         }
         attr.u_ra_vclass = {};
@@ -104,7 +104,7 @@ tbl *find_tbl_entry(cdgen &cx, const rsrc_variable_class_t *rvcp) {
 
 void add_tbl_entry(cdgen &cx, const rsrc_variable_class_t *rvcp, tbl *entry_ptr) {
     if (cx.tbl_entry_used == cx.tbl_entries.size())
-        bld_error_exit(cx, "Too many variable classes with dynamic attributes (100 at most)", nullptr, nullptr, 1);
+        bld_error_exit(MSG_TOO_MANY_VARIABLE_CLASSES, nullptr, nullptr, 1);
     cx.tbl_entries[cx.tbl_entry_used++] = {rvcp, entry_ptr};
 }
 

@@ -18,14 +18,14 @@ inline bool was_given(const stanza_state &state, vx_uint32_t bit) {
     return (state.opt_mask & bit) == bit;
 }
 
-inline void require_class(cdgen &cx, const char *message) {
+inline void require_class(cdgen &cx, message_id message) {
     if (cx.cb_rsrc_class.rc_cb_ID == 0)
         source_error(cx, message);
 }
 
 inline void require_complete(cdgen &cx, stanza_id id) {
     if (cx.stanzas[id].req_mask != sc_tables[id].req_mask_cmplt)
-        source_error(cx, "Previous stanza incomplete");
+        source_error(cx, MSG_INCOMPLETE_STANZA);
 }
 
 /* Appends a copy of a staging record to a table of such records. */

@@ -20,7 +20,7 @@ constexpr action_kind resource_kind = {SC_RESOURCE_ACTION, &cdgen::cb_rsrc_actio
 constexpr action_kind class_kind = {SC_CLASS_ACTION, &cdgen::cb_rsrc_actionC, &rsrc_class_t::u_rc_actionsC,
                                     CDB_ID_ACTION_C};
 
-constexpr const char *NO_CLASS = "No class for class action"; /* deliberately for both kinds */
+constexpr message_id NO_CLASS = MSG_NO_CLASS_FOR_ACTION; /* deliberately for both kinds */
 
 void complete_action(cdgen &cx, const action_kind &kind) {
     rsrc_action_t &action = cx.*kind.record;

@@ -26,7 +26,7 @@ constexpr dattr_kind class_kind = {.id = SC_DYNAMIC_CLASS_ATTRIBUTE,
                                    .cb_id = CDB_ID_DATTR_C,
                                    .shows_masks = true};
 
-constexpr const char *NO_CLASS = "No class for DynamicAttribute";
+constexpr message_id NO_CLASS = MSG_NO_CLASS_FOR_DATTR;
 
 vx_uint16_t &valid_vals_found(cdgen &cx, const dattr_kind &kind) {
     return cx.*(sc_tables[kind.id].sc_attr->vv_found);
@@ -43,7 +43,7 @@ void mark_absent(vx_value_t &value) {
 }
 
 /* A default bound, in containers of its own. */
-void default_bound(cdgen &cx, vx_value_t *bound, vx_data_type_t type, int mode, const char *failure) {
+void default_bound(cdgen &cx, vx_value_t *bound, vx_data_type_t type, int mode, message_id failure) {
     tbl *strings = staged_tbl(cx.cb_rsrc_class.u_rc_strings);
     sd_anchors anchors;
     int result = type == VX_SD_PTR_ARRAY ? copy_this_sd_type(cx, bound, VX_INT32, mode, strings, &anchors, 0, type)
@@ -58,10 +58,8 @@ void settle_range(cdgen &cx, rsrc_dattr_t &attr) {
         mark_absent(attr.ra_max_value);
     } else if (!cx.dattr_range_found) {
         cx.dattr_range_type = VX_UNKNOWN;
-        default_bound(cx, &attr.ra_min_value, attr.ra_data_type, R_LO_DEFAULT,
-                      "copy_this_type default min range error (dattr)");
-        default_bound(cx, &attr.ra_max_value, attr.ra_data_type, R_HI_DEFAULT,
-                      "copy_this_type default max range error (dattr)");
+        default_bound(cx, &attr.ra_min_value, attr.ra_data_type, R_LO_DEFAULT, MSG_NO_LOWER_BOUND);
+        default_bound(cx, &attr.ra_max_value, attr.ra_data_type, R_HI_DEFAULT, MSG_NO_UPPER_BOUND);
     }
     cx.dattr_range_found = 0;
 }
@@ -76,7 +74,7 @@ void settle_initial_value(cdgen &cx, const dattr_kind &kind, rsrc_dattr_t &attr)
     if (has_values(dflt))
         dump_dflt(cx, strings, &dflt, &attr.ra_init_value, attr.ra_data_type);
     else if (copy_this_type(cx, &attr.ra_init_value, nullptr, attr.ra_data_type, INIT_DEFAULT, strings, &array, 1) != 0)
-        source_error(cx, "copy_this_type default value error (dattr)");
+        source_error(cx, MSG_NO_INITIAL_VALUE);
 }
 
 void open_dattr(cdgen &cx, const dattr_kind &kind) {

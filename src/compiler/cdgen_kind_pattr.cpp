@@ -14,7 +14,7 @@ struct pattr_kind {
     rsrc_pattr_t cdgen::*record;
     cdb_ref_t rsrc_class_t::*records;
     vx_uint32_t cb_id;
-    const char *no_class;
+    message_id no_class;
     bool valid_vals_absent_at_open; /* deliberate: the resource kind marks them at its completion only */
     bool uses_default_values;       /* deliberate: the class kind's DefaultValue lines are never used */
 };
@@ -23,14 +23,14 @@ constexpr pattr_kind resource_kind = {.id = SC_PERSISTENT_RESOURCE_ATTRIBUTE,
                                       .record = &cdgen::cb_rsrc_pattr,
                                       .records = &rsrc_class_t::u_rc_pattrs,
                                       .cb_id = CDB_ID_PATTR,
-                                      .no_class = "No class for PersistentAttribute",
+                                      .no_class = MSG_NO_CLASS_FOR_PATTR,
                                       .valid_vals_absent_at_open = false,
                                       .uses_default_values = true};
 constexpr pattr_kind class_kind = {.id = SC_PERSISTENT_CLASS_ATTRIBUTE,
                                    .record = &cdgen::cb_rsrc_pattrC,
                                    .records = &rsrc_class_t::u_rc_pattrsC,
                                    .cb_id = CDB_ID_PATTR_C,
-                                   .no_class = "No class for pattr",
+                                   .no_class = MSG_NO_CLASS_FOR_PATTR_C,
                                    .valid_vals_absent_at_open = true,
                                    .uses_default_values = false};
 
@@ -48,7 +48,7 @@ void settle_default(cdgen &cx, const pattr_kind &kind, rsrc_pattr_t &attr) {
     if (kind.uses_default_values && has_values(dflt))
         dump_dflt(cx, strings, &dflt, &attr.ra_dflt_value, attr.ra_data_type);
     else if (copy_this_type(cx, &attr.ra_dflt_value, nullptr, attr.ra_data_type, DFLT_DEFAULT, strings, &array, 1) != 0)
-        source_error(cx, "copy_this_type default value error");
+        source_error(cx, MSG_NO_DEFAULT);
 }
 
 void open_pattr(cdgen &cx, const pattr_kind &kind) {

@@ -6,7 +6,7 @@ namespace {
 
 constexpr vx_uint32_t NO_ACTION_ID = 65535;
 constexpr vx_uint16_t VALID_TYPE = 1;
-constexpr const char *NO_CLASS = "No class for SD Definition";
+constexpr message_id NO_CLASS = MSG_NO_CLASS_FOR_SD;
 
 /* An empty list with room for its first entry. */
 template <class List> vx_uint32_t make_list(cdgen &cx, tbl *t, vx_uint32_t List::*id, vx_uint32_t value) {
@@ -18,7 +18,7 @@ template <class List> vx_uint32_t make_list(cdgen &cx, tbl *t, vx_uint32_t List:
 /* Room for one element more of the section at an offset: the first one's is in the header. Nothing else goes into the
  * table while a run is open, so that elements stand behind one another. */
 size_t next_sd_field(cdgen &cx, tbl *sd_defs, size_t section) {
-    if (record_at<sd_def_t>(cx, sd_defs, section)->sd_count == 0)
+    if (record_at<sd_def_t>(sd_defs, section)->sd_count == 0)
         return section + offsetof(sd_def_t, sd_fields);
     auto *field = static_cast<char *>(alloc_tble(cx, sd_defs, sizeof(sd_field_t)));
     return static_cast<size_t>(field - sd_defs->tbl_base);
@@ -27,11 +27,11 @@ size_t next_sd_field(cdgen &cx, tbl *sd_defs, size_t section) {
 /* Files the staged element into the section of its run. */
 void file_element(cdgen &cx) {
     if (!cx.sd_dt_found || !cx.sd_disp_found || !cx.sd_name_found || !cx.sd_desc_found)
-        source_error(cx, "Previous stanza incomplete");
+        source_error(cx, MSG_INCOMPLETE_STANZA);
     cx.sd_dt_found = cx.sd_disp_found = cx.sd_name_found = cx.sd_desc_found = 0;
     tbl *sd_defs = staged_tbl(cx.cb_rsrc_class.u_rc_sd_defs);
     if (sd_defs == nullptr)
-        source_error(cx, "No Class SD table for SD Definition");
+        source_error(cx, MSG_NO_SD_TABLE);
     size_t section = cx.curr_sd_tbl->offset[0];
     sd_field_t field = cx.cb_sd_def.sd_fields[0];
     field.sd_action_id = NO_ACTION_ID;
@@ -40,8 +40,8 @@ void file_element(cdgen &cx) {
         mark_absent(field.u_sd_valid_vals);
     cx.sd_vv_found = 0;
     size_t slot = next_sd_field(cx, sd_defs, section);
-    *record_at<sd_field_t>(cx, sd_defs, slot) = field;
-    ++record_at<sd_def_t>(cx, sd_defs, section)->sd_count;
+    *record_at<sd_field_t>(sd_defs, slot) = field;
+    ++record_at<sd_def_t>(sd_defs, section)->sd_count;
 }
 
 /* The attribute's value is one of the defaults of the run's element types. */
@@ -57,13 +57,12 @@ void dump_sd_default(cdgen &cx, const srtable_ctrl *scp) {
 void dump_sd_element(cdgen &cx, tbl *str_tbl, const dflt_tbl *vtbl, size_t i, vx_value_t *lval, vx_data_type_t dt,
                      sd_anchors *anchors) {
     auto type =
-        static_cast<vx_data_type_t>(record_at<vx_value_t>(cx, &vtbl->tbl->cells, i * sizeof(vx_value_t))->val_uint32);
+        static_cast<vx_data_type_t>(record_at<vx_value_t>(&vtbl->tbl->cells, i * sizeof(vx_value_t))->val_uint32);
     int mode = cx.sd_attr_type == 0 ? DFLT_DEFAULT : INIT_DEFAULT;
     anchors->array.reset();
     auto count = static_cast<vx_uint32_t>(vtbl->num_elems);
     if (copy_this_sd_type(cx, lval, type, mode, str_tbl, anchors, count, dt) != 0)
-        source_error(cx, mode == DFLT_DEFAULT ? "dump_dflt: copy_this_sd_type default error"
-                                              : "dump_dflt: copy_this_sd_type init error");
+        source_error(cx, mode == DFLT_DEFAULT ? MSG_NO_ELEMENT_DEFAULT : MSG_NO_ELEMENT_INITIAL);
 }
 
 } // namespace
@@ -83,7 +82,7 @@ vx_uint32_t mk_vty_sec(cdgen &cx) {
 
 vx_uint32_t mk_sd_data_tbl(cdgen &cx, vx_data_type_t sd_type, tbl *dflt_tp) {
     if (scalar_vx(sd_type) != VX_SD_PTR)
-        source_error(cx, "mk_sd_data_tbl: non-SD type - internal error");
+        source_error(cx, MSG_NOT_AN_SD_TYPE);
     size_t size = sd_type == VX_SD_PTR ? sizeof(vx_structured_data_t) : sizeof(vx_array_t);
     auto *header = static_cast<char *>(alloc_tble(cx, dflt_tp, size));
     return static_cast<vx_uint32_t>(header - dflt_tp->tbl_base);
@@ -123,9 +122,9 @@ void dump_dflt(cdgen &cx, tbl *str_tbl, const dflt_tbl *vtbl, vx_value_t *lval, 
             dump_sd_element(cx, str_tbl, vtbl, i, lval, dt, &anchors);
             continue;
         }
-        const auto *value = record_at<vx_value_t>(cx, &vtbl->tbl->cells, i * sizeof(vx_value_t));
+        const auto *value = record_at<vx_value_t>(&vtbl->tbl->cells, i * sizeof(vx_value_t));
         auto count = static_cast<vx_uint32_t>(vtbl->num_elems);
         if (copy_this_type(cx, lval, value, dt, TYPE_SAME, str_tbl, &anchors.array, count) != 0)
-            source_error(cx, "dump_dflt: copy_this_type error");
+            source_error(cx, MSG_DEFAULT_NOT_COPIED);
     }
 }

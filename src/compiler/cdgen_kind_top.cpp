@@ -45,13 +45,13 @@ constexpr cdb_ref_t rsrc_class_t::*absent_at_open[] = {
 void default_class_name(cdgen &cx) {
     const char *suffix = strstr(cx.cdefname, ".cdef"); /* deliberately the first, and not only at the end */
     if (suffix == nullptr)
-        cdgen_error_exit(cx, "Invalid cdef out file name (must end in .cdef)", nullptr, nullptr, 0, 1);
+        cdgen_error_exit(MSG_INVALID_OUTPUT_NAME, nullptr, nullptr, 0, 1);
     auto length = static_cast<size_t>(suffix - cx.cdefname);
-    std::unique_ptr<char, free_memory> name(static_cast<char *>(cfg_malloc(cx, length + 1)));
+    std::unique_ptr<char, free_memory> name(static_cast<char *>(cfg_malloc(length + 1)));
     memcpy(name.get(), cx.cdefname, length);
     tbl *strings = sc_tables[SC_RESOURCE_CLASS].sc_str_tbl(cx);
     if (strings == nullptr)
-        source_error(cx, "No tbl for strings table");
+        source_error(cx, MSG_NO_STRING_TABLE);
     cx.cb_rsrc_class.u_rc_name.offset[0] = add_to_tbl(cx, strings, name.get(), length + 1);
 }
 
@@ -75,7 +75,7 @@ void flush_raw(cdgen &cx, Attribute &attr, cdb_ref_t rsrc_class_t::*records, vx_
 void init_cmmap_tbl(cdgen &cx) {
     rsrc_cmmap_t &map = cx.cb_rsrc_cmmap;
     if (map.rcm_cb_ID != 0)
-        cdgen_error_exit(cx, "Only one ClassToManagerMapping stanza allowed", nullptr, nullptr, 0, 1);
+        cdgen_error_exit(MSG_SECOND_MAP, nullptr, nullptr, 0, 1);
     map = {};
     map.rcm_cb_ID = CDB_ID_CMMAP;
     stage_tbl(map.u_rcm_strings, make_tbl(cx, STRINGS_AU, "CMMapStrings"));
@@ -84,7 +84,7 @@ void init_cmmap_tbl(cdgen &cx) {
 void cmplt_cmmap_tbl(cdgen &cx) {
     rsrc_cmmap_t &map = cx.cb_rsrc_cmmap;
     if (map.rcm_first_key > map.rcm_last_key)
-        source_error(cx, "Error: FirstKey is greater than LastKey.");
+        source_error(cx, MSG_KEYS_REVERSED);
     append_record(cx, &cx.rsrc_cmmap_tbl, map);
     ++cx.rsrc_cmmap_count;
     map.rcm_cb_ID = 0;

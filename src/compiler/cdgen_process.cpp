@@ -41,7 +41,7 @@ void handle(int signal, void (*handler)(int)) {
 
 /* What the standard library does where there is no memory even for an exception. */
 [[noreturn]] void end_without_memory() {
-    fprintf(stderr, "cfg_malloc malloc failure: %s\n", strerror(ENOMEM));
+    fprintf(stderr, "%s%s\n", message_of(MSG_OUT_OF_MEMORY).text, strerror(ENOMEM));
     _exit(ENOMEM);
 }
 

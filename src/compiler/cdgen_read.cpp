@@ -30,7 +30,7 @@ bool refill(cdgen &cx) {
     while (n < 0 && errno == EINTR);
     if (n < 0) {
         int error = errno;
-        cdgen_error_exit(cx, cx.cdefsrc, ": cannot read because: ", strerror(error), 0, error);
+        cdgen_error_exit(MSG_CANNOT_READ, cx.cdefsrc, strerror(error), 0, error);
     }
     source.pos = 0;
     source.end = begun + static_cast<size_t>(n);
@@ -109,7 +109,7 @@ cdb_ref_t *owner_field(cdgen &cx, const sd_owner &owner) {
 /* The first stanza of a run makes the SD section and lets its owner refer to it. */
 void begin_sd_run(cdgen &cx, bool of_attribute) {
     if (!of_attribute && !class_is_open(cx))
-        source_error(cx, "No class for SD Definition");
+        source_error(cx, MSG_NO_CLASS_FOR_SD);
     if (cx.curr_sd_tbl == nullptr)
         cx.curr_sd_tbl = owner_field(cx, *cx.scp->sc_sd_owner);
     if (cx.curr_sd_tbl != nullptr) {
@@ -117,7 +117,7 @@ void begin_sd_run(cdgen &cx, bool of_attribute) {
         cx.sd_num_elems = 0;
     }
     if (of_attribute && cx.attr_dflt_val == nullptr)
-        source_error(cx, "Incorrect attribute type preceding this SD definition");
+        source_error(cx, MSG_NO_SD_ATTRIBUTE);
 }
 
 stanza_state &state_of(cdgen &cx, const srtable_ctrl *scp) {
@@ -175,7 +175,7 @@ void begin_plain_stanza(cdgen &cx) {
 void begin_stanza(cdgen &cx, const char *name) {
     cx.table_id = set_table_id(name);
     if (cx.table_id < 0)
-        source_error(cx, "Invalid table name: ", name);
+        source_error(cx, MSG_UNKNOWN_STANZA, name);
     cx.prev_scp = cx.scp;
     cx.scp = cx.curr_sd_scp = &sc_tables[static_cast<size_t>(cx.table_id)];
     cx.state = &state_of(cx, cx.scp);
@@ -212,7 +212,7 @@ void take_source(cdgen &cx, const char *filename, int fd) {
     source.fd = fd;
     struct stat st = {};
     if (source.fd < 0 || fstat(source.fd, &st) != 0)
-        cdgen_error_exit(cx, filename, ": cannot open because: ", strerror(errno), 0, errno);
+        cdgen_error_exit(MSG_CANNOT_OPEN, filename, strerror(errno), 0, errno);
     source.device = st.st_dev;
     source.inode = st.st_ino;
     cx.table_id = -1;
@@ -242,12 +242,29 @@ void take_line(cdgen &cx, const attr_text &text) {
     if (text.name == text.line)
         begin_stanza(cx, text.name);
     else if (cx.table_id < 0)
-        source_error(cx, "Attribute found but no table defined yet");
+        source_error(cx, MSG_NO_STANZA);
     else
         save_attr_line(cx, text, *cx.scp, *cx.state);
 }
 
+namespace {
+
+/* Closes the source however its reading ends. */
+struct closing {
+    explicit closing(source_file &file) : source(file) {}
+    closing(const closing &) = delete;
+    closing &operator=(const closing &) = delete;
+    ~closing() {
+        source.close();
+    }
+
+    source_file &source;
+};
+
+} // namespace
+
 void cache_input_data(cdgen &cx, const char *filename) {
+    closing at_end(cx.cdb_fp);
     open_source(cx, filename);
     for (;;) {
         source_line line = next_line(cx);
@@ -257,7 +274,6 @@ void cache_input_data(cdgen &cx, const char *filename) {
         if (text.end != nullptr)
             take_line(cx, text);
     }
-    cx.cdb_fp.close();
 }
 
 const char *is_SD_stanza(int table_id) {

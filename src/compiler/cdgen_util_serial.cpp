@@ -153,39 +153,39 @@ vx_uint32_t reserve(cdgen &cx, tbl *str_tbl, size_t size) {
 }
 
 /* Arrays and structured data begin with their element count. */
-vx_uint32_t count_element(cdgen &cx, tbl *str_tbl, vx_uint32_t container) {
-    auto *count = record_at<vx_uint32_t>(cx, str_tbl, container);
+vx_uint32_t count_element(tbl *str_tbl, vx_uint32_t container) {
+    auto *count = record_at<vx_uint32_t>(str_tbl, container);
     return (*count)++;
 }
 
 /* Writes to a cell inside a table that may move while the value is made. */
-template <class Write> auto with_cell(cdgen &cx, tbl *str_tbl, size_t offset, Write write) {
-    vx_value_t cell = *record_at<vx_value_t>(cx, str_tbl, offset);
+template <class Write> auto with_cell(tbl *str_tbl, size_t offset, Write write) {
+    vx_value_t cell = *record_at<vx_value_t>(str_tbl, offset);
     auto result = write(cell);
-    *record_at<vx_value_t>(cx, str_tbl, offset) = cell;
+    *record_at<vx_value_t>(str_tbl, offset) = cell;
     return result;
 }
 
 /* Types that are no value here: fatal. */
-void refuse(cdgen &cx, vx_data_type_t type) {
-    const char *message = type == VX_SD_PTR         ? "copy_this_type: this function does not handle SD type"
-                          : type == VX_SD_PTR_ARRAY ? "copy_this_type: this function does not handle SD ARRAY type"
-                          : type == VX_SBS_PTR      ? "VX_SBS_TYPE not supported"
-                                                    : nullptr;
-    if (message != nullptr)
-        cdgen_error_exit(cx, message, nullptr, nullptr, 0, 1);
+void refuse(vx_data_type_t type) {
+    message_id message = type == VX_SD_PTR         ? MSG_SD_NOT_COPIED
+                         : type == VX_SD_PTR_ARRAY ? MSG_SD_ARRAY_NOT_COPIED
+                         : type == VX_SBS_PTR      ? MSG_SBS_TYPE
+                                                   : NO_MESSAGE;
+    if (message != NO_MESSAGE)
+        cdgen_error_exit(message, nullptr, nullptr, 0, 1);
 }
 
 } // namespace
 
 vx_uint32_t init_array(cdgen &cx, tbl *str_tbl, tbl_anchor *anchor, vx_uint32_t array_cnt, vx_value_t *out_data) {
     if (array_cnt == 0)
-        cdgen_error_exit(cx, "Attempt to write NULL array", nullptr, nullptr, 0, 1);
+        cdgen_error_exit(MSG_NULL_ARRAY, nullptr, nullptr, 0, 1);
     if (!anchor->has_value()) {
         *anchor = reserve(cx, str_tbl, sizeof(vx_value_t) * (size_t{array_cnt} + 1));
         store_offset(*out_data, **anchor);
     }
-    vx_uint32_t index = count_element(cx, str_tbl, **anchor);
+    vx_uint32_t index = count_element(str_tbl, **anchor);
     return static_cast<vx_uint32_t>(**anchor + offsetof(vx_array_t, elements) + sizeof(vx_value_t) * index);
 }
 
@@ -200,7 +200,7 @@ vx_uint32_t init_scalar_sd(cdgen &cx, tbl *str_tbl, tbl_anchor *anchor, vx_uint3
                           sizeof(vx_structured_data_t) + sizeof(vx_structured_data_element_t) * (size_t{sd_cnt} - 1));
         store_offset(*out_data, **anchor);
     }
-    vx_uint32_t index = count_element(cx, str_tbl, **anchor);
+    vx_uint32_t index = count_element(str_tbl, **anchor);
     return static_cast<vx_uint32_t>(**anchor + offsetof(vx_structured_data_t, elements) +
                                     sizeof(vx_structured_data_element_t) * index);
 }
@@ -208,14 +208,14 @@ vx_uint32_t init_scalar_sd(cdgen &cx, tbl *str_tbl, tbl_anchor *anchor, vx_uint3
 vx_uint32_t init_array_sd(cdgen &cx, tbl *str_tbl, tbl_anchor *array_anchor, tbl_anchor *sd_anchor,
                           vx_uint32_t array_cnt, vx_uint32_t sd_cnt, vx_value_t *out_data) {
     if (array_cnt == 0)
-        cdgen_error_exit(cx, "Attempt to write NULL array", nullptr, nullptr, 0, 1);
+        cdgen_error_exit(MSG_NULL_ARRAY, nullptr, nullptr, 0, 1);
     if (!array_anchor->has_value()) {
         *array_anchor = reserve(cx, str_tbl, sizeof(vx_value_t) * (size_t{array_cnt} + 1));
         store_offset(*out_data, **array_anchor);
     }
     /* Deliberate: such an array always holds one structured value, whatever its capacity. */
-    *record_at<vx_uint32_t>(cx, str_tbl, **array_anchor) = 1;
-    return with_cell(cx, str_tbl, **array_anchor + offsetof(vx_array_t, elements),
+    *record_at<vx_uint32_t>(str_tbl, **array_anchor) = 1;
+    return with_cell(str_tbl, **array_anchor + offsetof(vx_array_t, elements),
                      [&](vx_value_t &cell) { return init_scalar_sd(cx, str_tbl, sd_anchor, sd_cnt, &cell); });
 }
 
@@ -225,7 +225,7 @@ int copy_this_type(cdgen &cx, vx_value_t *out_data, const vx_value_t *in_data, v
         copy_number(*out_data, *in_data, width); /* most values are plain numbers */
         return 0;
     }
-    refuse(cx, type_in);
+    refuse(type_in);
     if (type_in <= VX_UNKNOWN || type_in > VX_SD_PTR_ARRAY)
         return -1;
     bool in_array = is_vx_array(type_in);
@@ -233,7 +233,7 @@ int copy_this_type(cdgen &cx, vx_value_t *out_data, const vx_value_t *in_data, v
     if (!in_array)
         return encode(*out_data, e);
     vx_uint32_t slot = init_array(cx, str_tbl, array_anchor, array_cnt, out_data);
-    return with_cell(cx, str_tbl, slot, [&](vx_value_t &cell) { return encode(cell, e); });
+    return with_cell(str_tbl, slot, [&](vx_value_t &cell) { return encode(cell, e); });
 }
 
 int copy_this_sd_type(cdgen &cx, vx_value_t *out_data, vx_data_type_t type_in, int type_out, tbl *str_tbl,
@@ -244,12 +244,12 @@ int copy_this_sd_type(cdgen &cx, vx_value_t *out_data, vx_data_type_t type_in, i
     else if (sd_type == VX_SD_PTR_ARRAY)
         element = init_array_sd(cx, str_tbl, &anchors->sd_array, &anchors->sd_element, 1, array_cnt, out_data);
     else
-        cdgen_error_exit(cx, "copy_this_sd_type: only SD types allowed", nullptr, nullptr, 0, 1);
+        cdgen_error_exit(MSG_ONLY_SD_COPIED, nullptr, nullptr, 0, 1);
     if (array_cnt == 0)
         return 0;
-    int result = with_cell(cx, str_tbl, element + offsetof(vx_structured_data_element_t, value), [&](vx_value_t &cell) {
+    int result = with_cell(str_tbl, element + offsetof(vx_structured_data_element_t, value), [&](vx_value_t &cell) {
         return copy_this_type(cx, &cell, nullptr, type_in, type_out, str_tbl, &anchors->array, 1);
     });
-    record_at<vx_structured_data_element_t>(cx, str_tbl, element)->data_type = type_in;
+    record_at<vx_structured_data_element_t>(str_tbl, element)->data_type = type_in;
     return result;
 }

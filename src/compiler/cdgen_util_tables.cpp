@@ -24,10 +24,10 @@ void tbl::restart(const char *name) {
     tbl_name = name;
 }
 
-void *cfg_malloc(cdgen &cx, size_t s) {
+void *cfg_malloc(size_t s) {
     void *block = calloc(1, s);
     if (block == nullptr)
-        cdgen_error_exit(cx, "cfg_malloc malloc failure: ", strerror(errno), nullptr, 0, errno);
+        cdgen_error_exit(MSG_OUT_OF_MEMORY, strerror(errno), nullptr, 0, errno);
     return block;
 }
 
@@ -65,15 +65,15 @@ char *larger_block(tbl &t, size_t needed) {
     return nullptr;
 }
 
-[[noreturn]] void table_failure(cdgen &cx, const tbl &t, const char *what) {
+[[noreturn]] void table_failure(const tbl &t, message_id what) {
     int error = errno;
-    cdgen_error_exit(cx, t.tbl_name, what, strerror(error), 0, error);
+    cdgen_error_exit(what, t.tbl_name, strerror(error), 0, error);
 }
 
 void first_block(cdgen &cx, tbl &t) {
     char *block = t.tbl_spare != nullptr ? std::exchange(t.tbl_spare, nullptr) : larger_block(t, t.tbl_au);
     if (block == nullptr)
-        table_failure(cx, t, ": alloc_tble malloc failure: ");
+        table_failure(t, MSG_NO_MEMORY_FOR_TABLE);
     memset(block, 0, t.tbl_au);
     t.tbl_base = t.tbl_prev_base = t.tbl_next = block;
     t.tbl_size = t.tbl_au;
@@ -93,7 +93,7 @@ void grow(cdgen &cx, tbl &t, size_t s) {
     if (size > t.tbl_capacity) {
         char *block = larger_block(t, size);
         if (block == nullptr)
-            table_failure(cx, t, ": alloc_tble realloc failure: ");
+            table_failure(t, MSG_NO_MEMORY_TO_GROW);
         t.tbl_base = block;
         t.tbl_next = block + used;
     }
@@ -152,9 +152,9 @@ void memcpy_8_rounded(char *dst, const char *src, int len) {
         memset(dst + len, 0, static_cast<size_t>(rounded - len));
 }
 
-void *tbl_at(cdgen &cx, tbl_content *t, size_t offset, size_t size) {
+void *tbl_at(tbl_content *t, size_t offset, size_t size) {
     if (t->tbl_base == nullptr || offset > t->used() || size > t->used() - offset)
-        cdgen_error_exit(cx, t->tbl_name, ": reference outside the table - internal error", nullptr, 0, 1);
+        cdgen_error_exit(MSG_OUTSIDE_TABLE, t->tbl_name, nullptr, 0, 1);
     return t->tbl_base + offset;
 }
 
@@ -210,7 +210,7 @@ constexpr size_t SMALL = 256; /* bytes: a block for as little would take half as
 tbl_content *keep_copy(cdgen &cx, const tbl &t) {
     char *content = cx.filed_small.take(sizeof(tbl_content) + t.used());
     if (content == nullptr)
-        table_failure(cx, t, ": alloc_tble malloc failure: ");
+        table_failure(t, MSG_NO_MEMORY_FOR_TABLE);
     char *bytes = content + sizeof(tbl_content);
     memcpy(bytes, t.tbl_base, t.used());
     return new (content) tbl_content{bytes, bytes + t.used(), t.tbl_name};

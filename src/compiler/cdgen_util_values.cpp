@@ -328,7 +328,7 @@ char *strip_quotes(char *s, char **end) {
     return open == close ? open : open + 1;
 }
 
-void set_props(cdgen &cx, vx_uint32_t *dest, const props_t *props, int len, char *vnoq) {
+void set_props(vx_uint32_t *dest, const props_t *props, int len, char *vnoq) {
     for (char *rest = vnoq; rest != nullptr;) {
         char *name = rest;
         rest = getNextArrVal(rest);
@@ -338,7 +338,7 @@ void set_props(cdgen &cx, vx_uint32_t *dest, const props_t *props, int len, char
         while (known < props + len && (known->s[0] != name[0] || strcmp(known->s, name) != 0))
             ++known;
         if (known == props + len)
-            cdgen_error_exit(cx, name, ": invalid property", nullptr, 0, 1);
+            cdgen_error_exit(MSG_INVALID_PROPERTY, name, nullptr, 0, 1);
         *dest |= known->p;
     }
 }

@@ -131,7 +131,7 @@ json sarif_of(const std::string &file, const finding &found) {
 
 json rules() {
     json all = json::array();
-    for (const message &known : messages) {
+    for (const message &known : message_rows) {
         json rule;
         rule["id"] = known.code;
         rule["shortDescription"]["text"] = known.text;

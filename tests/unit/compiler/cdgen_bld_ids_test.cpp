@@ -240,8 +240,8 @@ TEST_F(VariableIds, HundredVariableClassesMayHaveThem) {
 }
 
 std::string message_of(const fatal_exit &failure) {
-    return std::string(failure.msg) + (failure.detail1 != nullptr ? failure.detail1 : "") +
-           (failure.detail2 != nullptr ? failure.detail2 : "");
+    auto [first, second, third] = words_of(failure);
+    return std::string(first) + second + third;
 }
 
 TEST_F(VariableIds, HundredAndFirstIsFatal) {

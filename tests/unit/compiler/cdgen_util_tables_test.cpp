@@ -309,14 +309,14 @@ ending out_of_memory(const std::string &what) {
 
 TEST_F(Tables, MemoryOfAContextComesZeroed) {
     for (size_t size : {1U, 24U, 4096U}) {
-        std::unique_ptr<char, free_memory> fresh(static_cast<char *>(cfg_malloc(cx, size)));
+        std::unique_ptr<char, free_memory> fresh(static_cast<char *>(cfg_malloc(size)));
         EXPECT_TRUE(all_zero(fresh.get(), fresh.get() + size)) << size;
     }
 }
 
 TEST_F(Tables, MemoryThatIsNotToBeHadIsFatal) {
     cx.linenum = 7;
-    EXPECT_EQ(ending_of([&] { cfg_malloc(cx, ABSURD); }), out_of_memory("cfg_malloc malloc failure: "));
+    EXPECT_EQ(ending_of([&] { cfg_malloc(ABSURD); }), out_of_memory("cfg_malloc malloc failure: "));
 }
 
 TEST_F(Tables, FirstBlockThatIsNotToBeHadIsFatal) {
@@ -429,7 +429,7 @@ TEST_F(Tables, OnlyTheUsedPartCanBeReferredTo) {
     for (const lookup &row : lookups) {
         SCOPED_TRACE(row.rule);
         void *at = nullptr;
-        auto end = ending_of([&] { at = tbl_at(cx, &t, row.offset, row.size); });
+        auto end = ending_of([&] { at = tbl_at(&t, row.offset, row.size); });
         EXPECT_EQ(end, row.found ? std::nullopt : std::optional(outside_the_table));
         EXPECT_EQ(at, row.found ? t.tbl_base + row.offset : nullptr);
     }
@@ -438,15 +438,15 @@ TEST_F(Tables, OnlyTheUsedPartCanBeReferredTo) {
 TEST_F(Tables, NothingCanBeReferredToInATableWithoutABlock) {
     tbl t(32, "Strings");
     for (size_t size : {0U, 1U})
-        EXPECT_EQ(ending_of([&] { tbl_at(cx, &t, 0, size); }), outside_the_table) << size;
+        EXPECT_EQ(ending_of([&] { tbl_at(&t, 0, size); }), outside_the_table) << size;
 }
 
 TEST_F(Tables, RecordsMustFitWhole) {
     tbl t(32, "Strings");
     vx_uint32_t numbers[] = {11, 22, 33};
     memcpy(alloc_tble(cx, &t, sizeof numbers), numbers, sizeof numbers);
-    EXPECT_EQ(*record_at<vx_uint32_t>(cx, &t, 8), 33U);
-    EXPECT_EQ(ending_of([&] { record_at<vx_uint64_t>(cx, &t, 8); }), outside_the_table);
+    EXPECT_EQ(*record_at<vx_uint32_t>(&t, 8), 33U);
+    EXPECT_EQ(ending_of([&] { record_at<vx_uint64_t>(&t, 8); }), outside_the_table);
 }
 
 TEST_F(Tables, RecordsAreThoseOfTheUsedPart) {

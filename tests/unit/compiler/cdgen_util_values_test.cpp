@@ -428,19 +428,18 @@ TEST(Quotes, MustMatch) {
 
 constexpr props_t props[] = {{"Public", 0x1}, {"Required", 0x20}, {"Public", 0x400}, {"Hidden", 0x8000}};
 
-vx_uint32_t props_of(cdgen &cx, std::string list) {
+vx_uint32_t props_of(std::string list) {
     vx_uint32_t bits = 0x80000002;
-    set_props(cx, &bits, props, 4, list.data());
+    set_props(&bits, props, 4, list.data());
     return bits;
 }
 
 TEST(Properties, AddTheirBits) {
-    cdgen cx;
-    EXPECT_EQ(props_of(cx, ""), 0x80000002);
-    EXPECT_EQ(props_of(cx, "Public"), 0x80000003); /* the first of that name */
-    EXPECT_EQ(props_of(cx, "Hidden,Public"), 0x80008003);
-    EXPECT_EQ(props_of(cx, "Public,Public"), 0x80000003);
-    EXPECT_EQ(props_of(cx, ",,Required,,Hidden,"), 0x80008022);
+    EXPECT_EQ(props_of(""), 0x80000002);
+    EXPECT_EQ(props_of("Public"), 0x80000003); /* the first of that name */
+    EXPECT_EQ(props_of("Hidden,Public"), 0x80008003);
+    EXPECT_EQ(props_of("Public,Public"), 0x80000003);
+    EXPECT_EQ(props_of(",,Required,,Hidden,"), 0x80008022);
 }
 
 TEST(Properties, UnknownOnesAreFatal) {
@@ -448,7 +447,7 @@ TEST(Properties, UnknownOnesAreFatal) {
     cx.linenum = 7;
     auto end = [&](std::string list) {
         vx_uint32_t bits = 0;
-        return ending_of([&] { set_props(cx, &bits, props, 3, list.data()); });
+        return ending_of([&] { set_props(&bits, props, 3, list.data()); });
     };
     EXPECT_EQ(end("public"), (ending{"public: invalid property", 0, 1}));
     EXPECT_EQ(end("Public, Required"), (ending{" Required: invalid property", 0, 1}));

@@ -34,15 +34,16 @@ inline std::ostream &operator<<(std::ostream &out, const ending &end) {
     return out << end.line << ": " << end.text << " (" << end.code << ")";
 }
 
-inline const char *text_of(const char *text) {
-    return text == nullptr ? "" : text;
+inline std::string text_of(const fatal_exit &end) {
+    auto [first, second, third] = words_of(end);
+    return std::string(first) + second + third;
 }
 
 template <class Step> ending ending_of(Step step) {
     try {
         step();
     } catch (const fatal_exit &end) {
-        return {std::string(text_of(end.msg)) + text_of(end.detail1) + text_of(end.detail2), end.line, end.code};
+        return {text_of(end), end.line, end.code};
     }
     return WELL;
 }
@@ -172,7 +173,7 @@ public:
     }
 
     std::string string_at(vx_uint32_t offset) {
-        return static_cast<const char *>(tbl_at(cx, content(&rsrc_class_t::u_rc_strings), offset, 1));
+        return static_cast<const char *>(tbl_at(content(&rsrc_class_t::u_rc_strings), offset, 1));
     }
 
     template <class Record> Record string_table_at(vx_uint32_t offset) {
@@ -181,7 +182,7 @@ public:
 
     template <class Record> Record copy_at(cdb_ref_t rsrc_class_t::*field, size_t offset) {
         Record record = {};
-        memcpy(&record, tbl_at(cx, content(field), offset, sizeof record), sizeof record);
+        memcpy(&record, tbl_at(content(field), offset, sizeof record), sizeof record);
         return record;
     }
 

@@ -82,9 +82,9 @@ template <class Call> std::optional<ending> ending_of(Call call) {
     try {
         call();
     } catch (const fatal_exit &e) {
-        std::string text = e.msg;
-        for (const char *detail : {e.detail1, e.detail2})
-            text += detail == nullptr ? "" : detail;
+        std::string text;
+        for (const char *part : words_of(e))
+            text += part;
         return ending{text, e.line, e.code};
     }
     return std::nullopt;

@@ -1,0 +1,33 @@
+/* cdgen_error.h: how a compilation ends early. */
+#ifndef CDGEN_CDGEN_ERROR_H
+#define CDGEN_CDGEN_ERROR_H
+
+#include "language/messages.h"
+
+#include <array>
+
+struct cdgen;
+
+/* The one exception, thrown by the fatal exits and caught by the driver. The details are literals, or stand in the
+ * context, or belong to the caller of the compilation; each may be null. */
+struct fatal_exit {
+    message_id id; /* NO_MESSAGE: nothing is to be printed */
+    const char *detail1;
+    const char *detail2;
+    int line; /* 0: none */
+    int code; /* exit status */
+};
+
+/* The message and its details in the order in which they are printed, without separators; none is null. There must be a
+ * message. */
+std::array<const char *, 3> words_of(const fatal_exit &failure);
+
+/* End the compilation: no return. Parsing and assembly use cdgen_error_exit, the image builder bld_error_exit. Details
+ * may be null. */
+[[noreturn]] void cdgen_error_exit(message_id id, const char *detail1, const char *detail2, int line, int code);
+[[noreturn]] void bld_error_exit(message_id id, const char *detail1, const char *detail2, int code);
+
+/* The usual case: a message about the current line, status 1. */
+[[noreturn]] void source_error(cdgen &cx, message_id id, const char *detail1 = nullptr, const char *detail2 = nullptr);
+
+#endif

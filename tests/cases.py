@@ -1,19 +1,13 @@
-"""What the drivers of single cases share: the registry, and a directory to run the programs in.
+"""A directory to run the programs in, and what is expected of a run."""
 
-A case is a function that takes a World and raises Failure when it does not
-hold, or Skip when the machine does not allow it.  A driver without a program
-prints the names of its cases, so that each can be a test of its own.
-"""
-
-import argparse
 import contextlib
 import os
 import pathlib
 import resource
 import shutil
 import subprocess
-import sys
-import tempfile
+
+import compare
 
 TIMEOUT = 300
 SKIPPED = 77
@@ -53,18 +47,11 @@ PersistentResourceAttribute
 """
 
 
-class Skip(Exception):
-    """The machine does not allow the case."""
-
-
-class Failure(Exception):
-    """The case does not hold."""
-
-
 def check(holds, *what):
     """Fail the case unless the condition holds."""
+    __tracebackhide__ = True
     if not holds:
-        raise Failure(" ".join(map(str, what)))
+        raise AssertionError(" ".join(map(str, what)))
 
 
 def attributes(count):
@@ -75,12 +62,12 @@ def attributes(count):
 class World:
     """A directory of its own with the program, a source, and what runs there."""
 
-    def __init__(self, options, directory):
+    def __init__(self, programs, directory):
         self.directory = directory
-        self.locales = options.locales
-        self.cdef = options.cdef
+        self.locales = programs.locales
+        self.cdef = programs.cdef
         self.program = directory / "cdgen"
-        shutil.copy(options.cdgen, self.program)  # where any user can reach it
+        shutil.copy(programs.cdgen, self.program)  # where any user can reach it
         os.chmod(directory, 0o777)
         self.write(SOURCE, HEAD)
 
@@ -145,8 +132,9 @@ class World:
 
 def expect(result, status, stderr=b"", stdout=b""):
     """Status and streams of a run, exactly."""
+    __tracebackhide__ = True
     actual = (result.returncode, result.stderr, result.stdout)
-    check(actual == (status, stderr, stdout), "expected", (status, stderr, stdout), "actual", actual)
+    compare.same(actual, (status, stderr, stdout), "status, standard error, standard output")
 
 
 def as_nobody():
@@ -165,45 +153,3 @@ def limit(what, value):
 def only_zeros(world):
     """What a failed filling leaves is no half database."""
     check(not world.read().strip(b"\0"), "the file is not empty of data")
-
-
-class Cases:
-    """The cases of one driver, by their names."""
-
-    def __init__(self):
-        self.functions = {}
-
-    def __call__(self, function):
-        """Registers a function as a case; a decorator."""
-        self.functions[function.__name__.replace("_", "-")] = function
-        return function
-
-    def run(self, name, options):
-        """One case in a directory of its own; "", "skipped" or what does not hold."""
-        with tempfile.TemporaryDirectory(prefix="cdgen-case-") as directory:
-            try:
-                self.functions[name](World(options, pathlib.Path(directory)))
-            except Skip as reason:
-                print(f"SKIP {name}\n    {reason}")
-                return SKIPPED
-            except (Failure, OSError, subprocess.SubprocessError) as problem:
-                print(f"FAIL {name}\n    {problem}")
-                return 1
-        return 0
-
-    def main(self, description):
-        """Runs the named cases, or all, and prints the count; without a program, prints the names."""
-        parser = argparse.ArgumentParser(description=description.splitlines()[0])
-        for given in ("cdgen", "cdef", "locales"):
-            parser.add_argument(f"--{given}", type=lambda text: pathlib.Path(text).resolve())
-        parser.add_argument("names", nargs="*")
-        options = parser.parse_args()
-        if options.cdgen is None:
-            print("\n".join(self.functions))
-            return 0
-        names = options.names or list(self.functions)
-        results = [self.run(name, options) for name in names]
-        print(f"{results.count(0)} passed, {results.count(1)} failed, {results.count(SKIPPED)} skipped")
-        if any(result == 1 for result in results):
-            return 1
-        return SKIPPED if results == [SKIPPED] else 0

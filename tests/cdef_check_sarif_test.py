@@ -3,25 +3,24 @@ cdef/sarif_schema.json, whatever is found and wherever it is, and says what
 `--format json` says.
 """
 
-import argparse
 import copy
 import json
 import pathlib
 import subprocess
-import sys
 import tempfile
 import unittest
 
 import jsonschema
 
-OPTIONS = argparse.Namespace()
-CASES = pathlib.Path(__file__).resolve().parent / "cdef/check"
+from programs import PROGRAMS, TESTS
+
+CASES = TESTS / "cdef/check"
 SCHEMA = jsonschema.Draft7Validator(json.loads((CASES.parent / "sarif_schema.json").read_text()))
 
 
 def check(form, *sources):
     """What is found in the sources, in a form."""
-    command = [OPTIONS.cdef, "check", "--format", form, *sources]
+    command = [PROGRAMS.cdef, "check", "--format", form, *sources]
     result = subprocess.run(command, cwd=CASES, capture_output=True, check=False, timeout=60)
     return json.loads(result.stdout)
 
@@ -95,15 +94,3 @@ class Schema(unittest.TestCase):
             bad = copy.deepcopy(good)
             change(bad)
             self.assertFalse(SCHEMA.is_valid(bad))
-
-
-def main():
-    """Run the tests."""
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--cdef", required=True, type=lambda text: pathlib.Path(text).resolve())
-    parser.parse_args(namespace=OPTIONS)
-    unittest.main(argv=[sys.argv[0]])
-
-
-if __name__ == "__main__":
-    main()

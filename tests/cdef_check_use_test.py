@@ -3,7 +3,6 @@ input of all kinds, and its exit statuses.  What it says of a source, the cases
 of cdef_check_test.py test.
 """
 
-import argparse
 import json
 import os
 import pathlib
@@ -15,9 +14,11 @@ import sys
 import tempfile
 import unittest
 
-OPTIONS = argparse.Namespace()
-EDITORS = pathlib.Path(__file__).resolve().parent.parent / "editors"
-CASES = pathlib.Path(__file__).resolve().parent / "cdef/check"
+from expectation import Expectation
+from programs import PROGRAMS, PROJECT, TESTS
+
+EDITORS = PROJECT / "editors"
+CASES = TESTS / "cdef/check"
 
 WRONG = "data-type.cdefsrc"
 ODD = "permission.cdefsrc"
@@ -29,13 +30,13 @@ DIRECTORY = "cdef: .: cannot read because: Is a directory\n"
 def check(*operands, stdin=subprocess.DEVNULL):
     """Status, output and messages of `cdef check`, run among the cases."""
     result = subprocess.run(
-        [OPTIONS.cdef, "check", *operands], cwd=CASES, stdin=stdin, capture_output=True, check=False, timeout=60)
+        [PROGRAMS.cdef, "check", *operands], cwd=CASES, stdin=stdin, capture_output=True, check=False, timeout=60)
     return result.returncode, result.stdout.decode(), result.stderr.decode()
 
 
 def expected(source, shown=None):
     """What is said of a case's source, under its own or another name."""
-    text = (CASES / source).with_suffix(".expect").read_text().partition("---\n")[2]
+    text = Expectation((CASES / source).with_suffix(".expect"), ("status",), ("stderr",)).get("stderr")
     return text.replace(f"{source}:", f"{shown or source}:")
 
 
@@ -155,12 +156,12 @@ class Surroundings(unittest.TestCase):
     def test_standard_error_that_is_full(self):
         for source, status in ((ODD, 2), (WRONG, 2), (RIGHT, 0)):
             with open("/dev/full", "wb") as full:
-                result = subprocess.run([OPTIONS.cdef, "check", source], cwd=CASES, stdout=subprocess.PIPE, stderr=full)
+                result = subprocess.run([PROGRAMS.cdef, "check", source], cwd=CASES, stdout=subprocess.PIPE, stderr=full)
             self.assertEqual((result.returncode, result.stdout), (status, b""), source)
 
     def limited(self, kilobytes, *operands):
         """A run in so much address space."""
-        command = shlex.join([str(OPTIONS.cdef), *map(str, operands)])
+        command = shlex.join([str(PROGRAMS.cdef), *map(str, operands)])
         return subprocess.run(
             ["sh", "-c", f"ulimit -v {kilobytes} && exec {command}"], capture_output=True, text=True, timeout=60
         )
@@ -189,7 +190,7 @@ class Surroundings(unittest.TestCase):
             source.write_text(head + body + "ClassToManagerMapping\n" + tail)
             command = ("check", "--format", "json", source)
             kilobytes, failures, step = self.least_memory(), 0, 128
-            good = subprocess.run([OPTIONS.cdef, *command], capture_output=True, text=True, timeout=60)
+            good = subprocess.run([PROGRAMS.cdef, *command], capture_output=True, text=True, timeout=60)
             self.assertIn(good.returncode, (0, 1), good.stderr)
             while (result := self.limited(kilobytes, *command)).returncode == 2:
                 self.assertIn(result.stdout, ("", "[]\n"), kilobytes)
@@ -256,15 +257,3 @@ class StandardInput(unittest.TestCase):
         directory = os.open(CASES, os.O_RDONLY)
         self.addCleanup(os.close, directory)
         self.assertEqual(check("-", stdin=directory), (2, "", DIRECTORY.replace(".:", "-:")))
-
-
-def main(title=__doc__):
-    """Run the tests of the program that was started."""
-    parser = argparse.ArgumentParser(description=title.splitlines()[0])
-    parser.add_argument("--cdef", required=True, type=lambda text: pathlib.Path(text).resolve())
-    parser.parse_args(namespace=OPTIONS)
-    unittest.main(argv=[sys.argv[0]])
-
-
-if __name__ == "__main__":
-    main()

@@ -1,19 +1,18 @@
 """Compare databases with cdef diff: what it says, and what it calls compatible.
 
-A case is a file below tests/cdef/diff of blocks; a block is a line that names
-it and the lines up to the next such line:
+A case is a file below tests/cdef/diff in the notation of expectation.py, of
+these blocks:
 
-    replace     lines of base.cdefsrc, which stand there once
-    with        what stands there in the second source; no lines remove them
-    diff        what cdef diff says of the two; nothing if they are the same
-    compat      what cdef diff --compat says of them
+    replace:    lines of base.cdefsrc, which stand there once
+    with:       what stands there in the second source; no lines remove them
+    diff:       what cdef diff says of the two; nothing if they are the same
+    compat:     what cdef diff --compat says of them
 
-replace and with may come several times.  Lines in front of the first block
-say what the case is for.  Each comparison runs in all four combinations of
+replace and with may come several times.  Each comparison runs in all four combinations of
 byte orders, and cdef diff the other way round too, where all that is new and
 all that is gone change places.
 
-Everything else is a check in this file, by name.
+Everything else is a test in this file.
 """
 
 import itertools
@@ -22,15 +21,14 @@ import os
 import pathlib
 import subprocess
 import sys
-import tempfile
 
-import cdef_cases
+import pytest
 
-TESTS = pathlib.Path(__file__).parent
-sys.path.insert(0, str(TESTS / "image"))
-
-import cdb_image  # noqa: E402
-import make_images  # noqa: E402  (the path has to be set first)
+import cdb_image
+import make_images
+from compare import same
+from expectation import Expectation
+from programs import PROGRAMS, TESTS
 
 CASES = TESTS / "cdef" / "diff"
 BLOCKS = ("replace", "with", "diff", "compat")
@@ -41,8 +39,8 @@ TURNED = {"-": "+", "+": "-"}
 class Programs:
     """The two programs, and a directory to run them in."""
 
-    def __init__(self, options, directory):
-        self.cdgen, self.cdef, self.directory = options.cdgen, options.cdef, pathlib.Path(directory)
+    def __init__(self, directory):
+        self.cdgen, self.cdef, self.directory = PROGRAMS.cdgen, PROGRAMS.cdef, pathlib.Path(directory)
 
     def compile(self, source, name, *options, stamp=False):
         """Compile a text; the database's name."""
@@ -85,36 +83,26 @@ def base():
     return (CASES / "base.cdefsrc").read_text()
 
 
-def blocks_of(text):
-    """(name, lines) of a case's blocks."""
-    blocks = []
-    for line in text.splitlines():
-        if line in BLOCKS:
-            blocks.append((line, []))
-        elif blocks:
-            blocks[-1][1].append(line)
-    return blocks
-
-
 def replaced(source, old, new):
-    """The source with one run of lines in place of another."""
-    whole, lines = "\n" + source, "\n" + "\n".join(old) + "\n"
+    """The source with one run of whole lines in place of another."""
+    whole, lines = "\n" + source, "\n" + old
     if whole.count(lines) != 1:
         raise ValueError(f"stands {whole.count(lines)} times in the base: {old}")
-    return whole.replace(lines, "\n" + "".join(line + "\n" for line in new))[1:]
+    return whole.replace(lines, "\n" + new)[1:]
 
 
 def read_case(path):
     """The second source and the expected texts of both comparisons."""
-    blocks = blocks_of(path.read_text())
+    said = Expectation(path, (), BLOCKS)
+    changes = said.all("replace", "with")
+    if [name for name, _ in changes] != ["replace", "with"] * (len(changes) // 2):
+        raise ValueError(f"{path}: replace without with")
     source = base()
-    for (name, old), (other, new) in itertools.pairwise(blocks):
-        if name == "replace":
-            if other != "with":
-                raise ValueError("replace without with")
-            source = replaced(source, old, new)
-    texts = {name: "".join(line + "\n" for line in lines) for name, lines in blocks if name in ("diff", "compat")}
-    return source, texts["diff"], texts["compat"]
+    for (_, old), (_, new) in zip(changes[::2], changes[1::2]):
+        source = replaced(source, old, new)
+    if not (said.has("diff") and said.has("compat")):
+        raise ValueError(f"{path}: diff or compat is missing")
+    return source, said.get("diff"), said.get("compat")
 
 
 def turned(text):
@@ -166,29 +154,28 @@ LABELS = (
 )
 
 
-def expect(problems, what, actual, expected):
-    """Note a difference."""
-    if actual != expected:
-        problems.append(f"{what}:\n  expected {expected!r}\n  actual   {actual!r}")
+@pytest.fixture
+def programs(directory):
+    """The programs, with a directory of their own."""
+    return Programs(directory)
 
 
-def check_case(programs, path):
+@pytest.mark.parametrize("name", sorted(path.stem for path in CASES.glob("*.expect")))
+def test_case(programs, name):
     """All comparisons of one case."""
-    problems = []
-    source, difference, breaches = read_case(path)
+    source, difference, breaches = read_case(CASES / f"{name}.expect")
     databases = [
         (programs.compile(base(), f"a{order}.cdef", *order.split()), programs.compile(source, f"b{order}.cdef", *order.split()))
         for order in ("", "-s")
     ]
     for a, b in itertools.product((a for a, _ in databases), (b for _, b in databases)):
-        expect(problems, f"{a} {b}", programs.diff(a, b), (1 if difference else 0, difference, ""))
-        expect(problems, f"--compat {a} {b}", programs.diff("--compat", a, b), (1 if breaches else 0, breaches, ""))
+        same(programs.diff(a, b), (1 if difference else 0, difference, ""), a, b)
+        same(programs.diff("--compat", a, b), (1 if breaches else 0, breaches, ""), "--compat", a, b)
         status, back, _ = programs.diff(b, a)
-        expect(problems, f"{b} {a}", (status, sorted(back.splitlines())), (1 if difference else 0, turned(difference)))
-    return problems
+        same((status, sorted(back.splitlines())), (1 if difference else 0, turned(difference)), b, a)
 
 
-# ---- Checks ----------------------------------------------------------------
+# ---- What no case shows ----------------------------------------------------------------
 
 WRONG_CHECKSUM = "cdef: {}: wrong checksum\n"
 NOT_ZERO = "cdef: {}: reserved bytes or filling not zero\n"
@@ -209,7 +196,7 @@ def attribute(name, number, *lines, kind="PersistentResourceAttribute", datatype
     return kind + "\n" + "".join(f"\t{line}\n" for line in [*given, *lines])
 
 
-def layout_is_not_compared(programs, problems):
+def test_layout_is_not_compared(programs):
     """The order of stanzas, of lines and of sections' contents, checksum, time and what nothing refers to."""
     a, b = attribute("A", 1, "DefaultValue=5"), attribute("B", 2, "DefaultValue=x", "DefaultValue=y", datatype="String")
     d = attribute("D", 3, kind="DynamicClassAttribute")
@@ -217,10 +204,10 @@ def layout_is_not_compared(programs, problems):
     moved = class_source(d, b.replace("\tDefaultValue=x\n", ""), a, head="\tName=C\n")
     second = programs.compile(moved, "second.cdef", "-s", stamp=True)
     programs.patch(second, 4, b"wrong sum"[:4])
-    expect(problems, "diff", programs.diff(first, second), (0, "", WRONG_CHECKSUM.format(second)))
+    same(programs.diff(first, second), (0, "", WRONG_CHECKSUM.format(second)), "diff")
 
 
-def classes_are_named_where_there_are_several(programs, problems):
+def test_classes_are_named_where_there_are_several(programs):
     """With two classes in one of the databases the class is said."""
     control = "ControlDefinition\n\tFileVersion=1.0.0.0\n"
     resource = "ResourceClass\n\tDescription=1\n\tDisplayName=2\n\tProperties=CanDefine\n\tClassPermTemplate=0\n\tResourcePermTemplate=0\n"
@@ -229,28 +216,28 @@ def classes_are_named_where_there_are_several(programs, problems):
     two = programs.compile(class_source(attribute("A", 2), second, head="\tName=First\n"), "two.cdef")
     status, text, _ = programs.diff("--compat", one, two)
     line = "~ ResourceClass 'First', PersistentResourceAttribute 'A': Id 1 -> 2 (readers know it by its number)\n"
-    expect(problems, "changed", (status, text), (1, line))
+    same((status, text), (1, line), "changed")
     status, text, _ = programs.diff("--compat", two, one)
-    expect(problems, "removed", (status, "- ResourceClass 'Second' (readers miss it)\n" in text), (1, True))
+    same((status, "- ResourceClass 'Second' (readers miss it)\n" in text), (1, True), "removed")
 
 
-def equal_names_pair_by_position(programs, problems):
+def test_equal_names_pair_by_position(programs):
     """Two attributes of one name are two; the one too many is the last."""
     one = programs.compile(class_source(attribute("A", 1), attribute("A", 2), head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(*(attribute("A", i) for i in (1, 3, 4)), head="\tName=C\n"), "two.cdef")
     text = "~ PersistentResourceAttribute 'A': Id 2 -> 3\n+ PersistentResourceAttribute 'A'\n"
-    expect(problems, "diff", programs.diff(one, two), (1, text, ""))
+    same(programs.diff(one, two), (1, text, ""), "diff")
 
 
-def texts_are_escaped(programs, problems):
+def test_texts_are_escaped(programs):
     """Nothing of a name can act on a terminal."""
     one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(attribute("a\x1b[2J'\\\x7fü", 1), head="\tName=C\n"), "two.cdef")
     text = "+ PersistentResourceAttribute 'a\\x1b[2J\\'\\\\\\x7f\\xc3\\xbc'\n"
-    expect(problems, "diff", programs.diff(one, two), (1, text, ""))
+    same(programs.diff(one, two), (1, text, ""), "diff")
 
 
-def values_of_every_type(programs, problems):
+def test_values_of_every_type(programs):
     """How values read."""
     values = {
         "Int32": ("-1", "-1"),
@@ -267,10 +254,10 @@ def values_of_every_type(programs, problems):
     stanzas = (attribute(t, 1, f"DefaultValue={v[0]}", datatype=t) for t, v in values.items())
     two = programs.compile(class_source(*stanzas, head="\tName=C\n"), "two.cdef", "-s")
     lines = [f"~ PersistentResourceAttribute '{t}': default {nothing.get(t, 0)} -> {v[1]}\n" for t, v in values.items()]
-    expect(problems, "diff", programs.diff(one, two), (1, "".join(lines), ""))
+    same(programs.diff(one, two), (1, "".join(lines), ""), "diff")
 
 
-def missing_values_are_nothing(programs, problems):
+def test_missing_values_are_nothing(programs):
     """An SD-typed attribute without a run has no value, and one with a run has elements and a value."""
     run = "PAttrSDDefinition\n\tElementName=E\n\tDescription=1\n\tDisplayName=2\n\tElementIndex=0\n\tDataType=Int32\n"
     one = programs.compile(class_source(attribute("A", 1, datatype="SD"), head="\tName=C\n"), "one.cdef")
@@ -280,10 +267,10 @@ def missing_values_are_nothing(programs, problems):
         "~ PersistentResourceAttribute 'A': highest element index none -> 0\n",
         "+ PersistentResourceAttribute 'A', element 'E'\n",
     ]
-    expect(problems, "diff", programs.diff(one, two), (1, "".join(lines), ""))
+    same(programs.diff(one, two), (1, "".join(lines), ""), "diff")
 
 
-def fields_without_a_line_are_compared(programs, problems):
+def test_fields_without_a_line_are_compared(programs):
     """Fields that no source sets: in the header, an anchor, the class, the manager and the map."""
     name = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
     # Anchors stand at 80; the class at 128 has 224 bytes and strings of 8, the manager 24 and 16, then comes the map.
@@ -303,7 +290,7 @@ def fields_without_a_line_are_compared(programs, problems):
     ]
     # The largest numbers in the header follow those of the class and the manager.
     programs.patch("two.cdef", 28, bytes([4, 0, 3, 0]))
-    expect(problems, "diff", programs.diff(name, "two.cdef"), (1, "".join(lines), WRONG_CHECKSUM.format("two.cdef")))
+    same(programs.diff(name, "two.cdef"), (1, "".join(lines), WRONG_CHECKSUM.format("two.cdef")), "diff")
 
 
 # What one changed number of an image makes of it: the image, the number, and what there is to say.
@@ -325,22 +312,22 @@ CHANGED_NUMBERS = [
 ]
 
 
-def records_that_are_never_written_are_compared(programs, problems):
+def test_records_that_are_never_written_are_compared(programs):
     """Errors, dependencies and a class hash: the compiler makes none, but there may be some."""
     for name, number, text in CHANGED_NUMBERS:
         for a, b in itertools.product(make_images.ORDERS, repeat=2):
             one, two = programs.image(name, a), programs.image(name, b, number)
-            expect(problems, f"{name} {number} {a} {b}", programs.diff(one, two), (1, text, ""))
+            same(programs.diff(one, two), (1, text, ""), f"{name} {number} {a} {b}")
 
 
-def places_in_a_class_hash_are_not_compared(programs, problems):
+def test_places_in_a_class_hash_are_not_compared(programs):
     """The head of a chain, a block's link and its class."""
     for order in make_images.ORDERS:
         one, two = programs.image("hash", order), programs.image("hash", order, "u32 100 8", "u32 8296 9", "u32 8312 9")
-        expect(problems, order, programs.diff(one, two), (0, "", ""))
+        same(programs.diff(one, two), (0, "", ""), order)
 
 
-def json_says_the_same(programs, problems):
+def test_json_says_the_same(programs):
     """One object for each difference."""
     one = programs.compile(class_source(attribute("A", 1), attribute("B", 2), head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(attribute("A", 3), head="\tName=C\n"), "two.cdef")
@@ -359,12 +346,12 @@ def json_says_the_same(programs, problems):
         "path": [*path, {"kind": "PersistentResourceAttribute", "name": "'B'"}],
         "breaks": "readers miss it",
     }
-    expect(problems, "different", (status, json.loads(text)), (1, [changed, removed]))
+    same((status, json.loads(text)), (1, [changed, removed]), "different")
     status, text, _ = programs.diff("--json", one, one)
-    expect(problems, "same", (status, json.loads(text)), (0, []))
+    same((status, json.loads(text)), (0, []), "same")
 
 
-def json_of_what_is_new_and_of_the_database(programs, problems):
+def test_json_of_what_is_new_and_of_the_database(programs):
     """A thing of its own has a path of its own, the database an empty one; what breaks nothing has no reason."""
     one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(attribute("A", 1), head="\tName=C\n"), "two.cdef")
@@ -373,27 +360,27 @@ def json_of_what_is_new_and_of_the_database(programs, problems):
     status, text, _ = programs.diff("--json", one, two)
     sequence = int.from_bytes([7, 0, 0, 0], sys.byteorder)
     changed = {"change": "changed", "path": [], "field": "cdb_hdr_seqno", "before": "0", "after": str(sequence)}
-    expect(problems, "diff", (status, json.loads(text)), (1, [changed, {"change": "added", "path": path}]))
+    same((status, json.loads(text)), (1, [changed, {"change": "added", "path": path}]), "diff")
 
 
-def references_that_are_never_set_may_be_none(programs, problems):
+def test_references_that_are_never_set_may_be_none(programs):
     """None is no other place than 0, where they lead by default."""
     for order in make_images.ORDERS:
         # Of a dynamic attribute of the class, which stands at 368, and of the manager, at 1328.
         one, two = programs.image("small", order), programs.image("small", order, "u32 392 -1", "u32 1344 -1")
-        expect(problems, order, programs.diff(one, two), (0, "", ""))
+        same(programs.diff(one, two), (0, "", ""), order)
         three = programs.image("small", order, "u32 392 24")
         text = "~ DynamicClassAttribute 'dc': u_ra_next_in_vclass 0 -> 24\n"
-        expect(problems, f"{order}, another place", programs.diff(two, three), (1, text, ""))
+        same(programs.diff(two, three), (1, text, ""), f"{order}, another place")
 
 
-def sections_of_unused_types_pair_by_type(programs, problems):
+def test_sections_of_unused_types_pair_by_type(programs):
     """Their contents are not compared, but that they are there."""
     for order in make_images.ORDERS:
         one = programs.image("sections", order)
         two = programs.image("sections", order, "u32 112 2", "u32 192 9")  # the third anchor's type, and contents
         text = "- section of type 1\n+ section of type 2\n"
-        expect(problems, order, programs.diff(one, two), (1, text, ""))
+        same(programs.diff(one, two), (1, text, ""), order)
 
 
 # The last attribute of a class that another one cuts short seems to have the valid values of the first one, which are
@@ -427,41 +414,41 @@ def same_text(count, length):
     return cdb_image.assemble(text, sys.byteorder, sys.byteorder, TESTS / "golden")
 
 
-def values_that_lead_to_one_text_too_often_are_refused(programs, problems):
+def test_values_that_lead_to_one_text_too_often_are_refused(programs):
     """What would be told is out of proportion to the file; but not that they do."""
     (programs.directory / "few.cdef").write_bytes(same_text(10, 32767))
-    expect(problems, "few", programs.diff("few.cdef", "few.cdef"), (0, "", ""))
+    same(programs.diff("few.cdef", "few.cdef"), (0, "", ""), "few")
     (programs.directory / "many.cdef").write_bytes(same_text(100, 32767))
     message = "cdef: many.cdef: values or texts that lead to the same place too often\n"
-    expect(problems, "many", programs.diff("many.cdef", "many.cdef"), (2, "", message))
+    same(programs.diff("many.cdef", "many.cdef"), (2, "", message), "many")
 
 
-def one_may_be_standard_input(programs, problems):
+def test_one_may_be_standard_input(programs):
     """Either of the two, but not both."""
     one = programs.compile(class_source(attribute("A", 1), head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(head="\tName=C\n"), "two.cdef")
     contents = (programs.directory / one).read_bytes()
-    expect(problems, "A", programs.diff("-", two, stdin=contents), (1, "- PersistentResourceAttribute 'A'\n", ""))
-    expect(problems, "B", programs.diff(two, "-", stdin=contents), (1, "+ PersistentResourceAttribute 'A'\n", ""))
-    expect(problems, "both", programs.diff("-", "-", stdin=contents)[:2], (2, ""))
+    same(programs.diff("-", two, stdin=contents), (1, "- PersistentResourceAttribute 'A'\n", ""), "A")
+    same(programs.diff(two, "-", stdin=contents), (1, "+ PersistentResourceAttribute 'A'\n", ""), "B")
+    same(programs.diff("-", "-", stdin=contents)[:2], (2, ""), "both")
 
 
-def what_is_tolerated_is_told(programs, problems):
+def test_what_is_tolerated_is_told(programs):
     """A wrong checksum and reserved bytes that are not 0: a line for each kind and database, whatever the status."""
     one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(attribute("A", 1), head="\tName=C\n"), "two.cdef")
     programs.patch(two, 60, b"\1")  # two of the header's spare bytes, which cancel out in the checksum
     programs.patch(two, 64, b"\1")
     added, gone = "+ PersistentResourceAttribute 'A'\n", "- PersistentResourceAttribute 'A' (readers miss it)\n"
-    expect(problems, "reserved", programs.diff(one, two), (1, added, NOT_ZERO.format(two)))
+    same(programs.diff(one, two), (1, added, NOT_ZERO.format(two)), "reserved")
     programs.patch(two, 68, b"\1")
     said = WRONG_CHECKSUM.format(two) + NOT_ZERO.format(two)
-    expect(problems, "both", programs.diff(one, two), (1, added, said))
-    expect(problems, "--compat", programs.diff("--compat", two, one), (1, gone, said))
-    expect(problems, "same", programs.diff("--compat", one, two), (0, "", said))
+    same(programs.diff(one, two), (1, added, said), "both")
+    same(programs.diff("--compat", two, one), (1, gone, said), "--compat")
+    same(programs.diff("--compat", one, two), (0, "", said), "same")
 
 
-def trouble_is_status_2(programs, problems):
+def test_trouble_is_status_2(programs):
     """A file that is not there, that is no database, or that is broken."""
     one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
     (programs.directory / "text").write_text("no database\n")
@@ -470,46 +457,4 @@ def trouble_is_status_2(programs, problems):
     for other in ("missing", "text", "broken.cdef"):
         for arguments in ((one, other), (other, one), ("--compat", one, other)):
             status, text, message = programs.diff(*arguments)
-            expect(problems, str(arguments), (status, text, message.startswith(f"cdef: {other}: ")), (2, "", True))
-
-
-CHECKS = [
-    layout_is_not_compared,
-    classes_are_named_where_there_are_several,
-    equal_names_pair_by_position,
-    texts_are_escaped,
-    values_of_every_type,
-    missing_values_are_nothing,
-    fields_without_a_line_are_compared,
-    records_that_are_never_written_are_compared,
-    places_in_a_class_hash_are_not_compared,
-    json_says_the_same,
-    json_of_what_is_new_and_of_the_database,
-    references_that_are_never_set_may_be_none,
-    sections_of_unused_types_pair_by_type,
-    values_that_lead_to_one_text_too_often_are_refused,
-    one_may_be_standard_input,
-    what_is_tolerated_is_told,
-    trouble_is_status_2,
-]
-
-
-def run(name, options):
-    """The problems of one case or check."""
-    with tempfile.TemporaryDirectory() as directory:
-        programs = Programs(options, directory)
-        path = CASES / f"{name}.case"
-        if path.exists():
-            return check_case(programs, path)
-        problems = []
-        {check.__name__: check for check in CHECKS}[name](programs, problems)
-        return problems
-
-
-def names():
-    """All cases and checks."""
-    return [path.stem for path in sorted(CASES.glob("*.case"))] + [check.__name__ for check in CHECKS]
-
-
-if __name__ == "__main__":
-    sys.exit(cdef_cases.main(__doc__.splitlines()[0], names, run))
+            same((status, text, message.startswith(f"cdef: {other}: ")), (2, "", True), str(arguments))

@@ -1,6 +1,6 @@
 """Check `cdef dump`: listings, JSON, annotated bytes.
 
-Without a case, prints the names of all.  The cases of tests/cdef/dump are
+The cases of tests/cdef/dump are
 
     listing/NAME    the listing of NAME.cdefsrc (or NAME.image, in the notation
                     of cdb_image.py) is NAME.txt, in both byte orders but for
@@ -11,11 +11,9 @@ Without a case, prints the names of all.  The cases of tests/cdef/dump are
     hex/NAME        the annotated bytes of listing/NAME are NAME.txt
     regions/NAME    they are the file's, every byte once, whole or damaged
 
-The others are the functions below that begin with case_.  A source is compiled
-to out.cdef; examples/NAME.cdefsrc serves where there is none beside.
+The others are functions below.  A source is compiled to out.cdef; examples/NAME.cdefsrc serves where there is none beside.
 """
 
-import argparse
 import json
 import os
 import pathlib
@@ -27,33 +25,29 @@ import sys
 import tempfile
 import unicodedata
 
+import pytest
+
 import cdb_image
 import cdef_dump_listing
+import compare
 import documents
+from programs import EXAMPLES, PROGRAMS, PROJECT, TESTS
 
-HERE = pathlib.Path(__file__).resolve().parent
-CASES = HERE / "cdef" / "dump"
-EXAMPLES = HERE.parent / "examples"
-README = HERE.parent / "README.md"
+CASES = TESTS / "cdef" / "dump"
+README = PROJECT / "README.md"
 TIMEOUT = 60
 OK, TROUBLE = 0, 2
 OTHER = {"little": "big", "big": "little"}
 
 
-class Failure(Exception):
+class Failure(AssertionError):
     """What a case found wrong."""
 
 
 def expect(actual, expected, what):
-    """Fail, with the first difference, unless two things are equal."""
-    if actual == expected:
-        return
-    if isinstance(actual, str) and isinstance(expected, str):
-        left, right = expected.split("\n"), actual.split("\n")
-        for number, (one, two) in enumerate(zip(left + [None], right + [None]), 1):
-            if one != two:
-                raise Failure(f"{what}, line {number}:\n  expected {one!r}\n  actual   {two!r}")
-    raise Failure(f"{what}:\n  expected {expected!r}\n  actual   {actual!r}")
+    """Fail, with the difference, unless two things are equal."""
+    __tracebackhide__ = True
+    compare.same(actual, expected, what)
 
 
 # ---- Databases ------------------------------------------------------------------------------------------------------
@@ -134,14 +128,22 @@ def parsed(text):
 
 # ---- Cases by file --------------------------------------------------------------------------------------------------
 
+LISTINGS = sorted(path.stem for path in CASES.glob("listing/*.txt"))
+JSONS = sorted(path.stem for path in CASES.glob("json/*.json"))
+OFFSETS = sorted(path.stem for path in CASES.glob("offsets/*.txt"))
+HEXES = sorted(path.stem for path in CASES.glob("hex/*.txt"))
 
-def check_listing(name):
+
+
+@pytest.mark.parametrize("name", LISTINGS)
+def test_listing(name):
     """The listing in both byte orders."""
     for order in orders_of(name):
         expect(dump(database(name, order)), expected_text("listing", name, order), f"listing, {order}-endian")
 
 
-def check_facts(name):
+@pytest.mark.parametrize("name", LISTINGS)
+def test_facts(name):
     """The JSON has the listing's facts, in the listing's order."""
     for order in orders_of(name):
         told = cdef_dump_listing.Listing()
@@ -149,7 +151,8 @@ def check_facts(name):
         expect("\n".join(told.lines) + "\n", expected_text("listing", name, order), f"JSON, {order}-endian")
 
 
-def check_json(name):
+@pytest.mark.parametrize("name", JSONS)
+def test_json(name):
     """The JSON as it stands."""
     expected = json.loads((CASES / "json" / f"{name}.json").read_text("utf-8"))
     actual = parsed(dump(database(name), "--json"))
@@ -157,12 +160,14 @@ def check_json(name):
     expect(json.dumps(actual), json.dumps(expected), "order of the members")
 
 
-def check_offsets(name):
+@pytest.mark.parametrize("name", OFFSETS)
+def test_offsets(name):
     """The listing with offsets."""
     expect(dump(database(name), "--offsets"), expected_text("offsets", name), "listing with offsets")
 
 
-def check_hex(name):
+@pytest.mark.parametrize("name", HEXES)
+def test_hex(name):
     """The annotated bytes."""
     expect(dump(database(name), "--hex"), expected_text("hex", name), "annotated bytes")
 
@@ -207,7 +212,8 @@ UNREACHED = {
 }
 
 
-def check_regions(name):
+@pytest.mark.parametrize("name", LISTINGS)
+def test_regions(name):
     """Annotated bytes of a file, of its beginnings, and of the file with a byte turned over."""
     for order in orders_of(name):
         data = database(name, order)
@@ -220,10 +226,10 @@ def check_regions(name):
         check_bytes(patched(data, offset, bytes([data[offset] ^ 0xFF])), f"turned over at {offset}")
 
 
-# ---- Other cases ----------------------------------------------------------------------------------------------------
+# ---- Other tests ----------------------------------------------------------------------------------------------------
 
 
-def case_broken_structure_is_refused():
+def test_broken_structure_is_refused():
     """The section's offset leads out of the file: only the bytes can be shown."""
     data = patched(database("minimal"), 84, b"\xff\xff\xff\x7f")
     for options in ([], ["--json"], ["--offsets"]):
@@ -235,7 +241,7 @@ def case_broken_structure_is_refused():
     dump(data, "--hex")
 
 
-def case_no_database_is_refused():
+def test_no_database_is_refused():
     """Nothing, and something else."""
     for data in (b"", b"#!/bin/sh\n" * 20):
         dump(data, status=TROUBLE)
@@ -251,7 +257,7 @@ def readme_commands():
     return list(zip(parts[::2], parts[1::2]))
 
 
-def case_readme_shows_what_there_is():
+def test_readme_shows_what_there_is():
     """The README's commands print what it says, of the class that it shows; it leaves out lines at "..."."""
     source = documents.sources(README)[0]
     changed = source.replace("DefaultValue=4096", "DefaultValue=8192")
@@ -273,7 +279,7 @@ def case_readme_shows_what_there_is():
         expect(result.stdout.startswith("#"), True, "a source")
 
 
-def case_wrong_checksum_is_told():
+def test_wrong_checksum_is_told():
     """The display message number 2 became 3; 3 ^ 2 = 1 changes the word's upper half."""
     data = patched(database("minimal"), 340, b"\x03")
     listing = expected_text("listing", "minimal").replace("rc_disp_msgid: 2", "rc_disp_msgid: 3")
@@ -286,7 +292,7 @@ def case_wrong_checksum_is_told():
     )
 
 
-def case_locator_of_no_attribute():
+def test_locator_of_no_attribute():
     """The class has no attribute 7."""
     data = patched(database("minimal"), 342, b"\x07\x00")
     expect(re.findall("rc_locator.*", dump(data)), ["rc_locator: 7, unknown"], "listing")
@@ -294,7 +300,7 @@ def case_locator_of_no_attribute():
     expect(told, {"number": 7, "kind": None, "name": None}, "JSON")
 
 
-def case_time_is_utc():
+def test_time_is_utc():
     """1700000000 seconds after 1970, whatever the time zone."""
     data = with_checksum(patched(database("minimal"), 16, struct.pack("<II", 1700000000, 42)))
     lines = dump(data, env={**os.environ, "TZ": "Asia/Tokyo"}).splitlines()
@@ -304,7 +310,7 @@ def case_time_is_utc():
     expect(header["cdb_hdr_timestamp.tv_sec"], "2106-02-07T06:28:15Z", "last time")
 
 
-def case_offsets_in_json():
+def test_offsets_in_json():
     """Each record tells where it is, and its references as they stand."""
     data = parsed(dump(database("minimal"), "--json", "--offsets"))
     expect(list(data["header"].items())[0], ("at", 0), "first member of the header")
@@ -313,7 +319,7 @@ def case_offsets_in_json():
     expect((first["class"]["u_rc_strings"], first["class"]["u_rc_errors"]), (224, 0), "references")
 
 
-def case_offsets_of_lists():
+def test_offsets_of_lists():
     """Lists and their entries, by the sizes of what stands in front of them."""
     text = dump(database("odd"), "--offsets")
     # 160 the class; its lists of varieties begin 616 behind, each 16 bytes, the values at 736.
@@ -329,7 +335,7 @@ def case_offsets_of_lists():
         expect(text.count(line + "\n"), 1, f"lines {line!r}")
 
 
-def case_file_and_standard_input_alike():
+def test_file_and_standard_input_alike():
     """A name, and -."""
     data = database("minimal")
     with tempfile.NamedTemporaryFile() as file:
@@ -345,20 +351,20 @@ def run(*arguments, **settings):
     return result.returncode, result.stderr.decode()
 
 
-def case_missing_file():
+def test_missing_file():
     """A file that is not there."""
     expected = (TROUBLE, "cdef: /nonexistent.cdef: No such file or directory\n")
     expect(run("/nonexistent.cdef"), expected, "status and message")
 
 
-def case_wrong_usage():
+def test_wrong_usage():
     """No file, two files, two forms."""
     for arguments in ([], ["a", "b"], ["--json", "--hex", "a"], ["--offsets", "--hex", "a"], ["--what", "a"]):
         status, message = run(*arguments)
         expect((status, bool(message)), (TROUBLE, True), f"status and message of {arguments}")
 
 
-def case_output_that_cannot_be_written():
+def test_output_that_cannot_be_written():
     """A full device."""
     data = database("FileSystem")
     for options in ([], ["--json"], ["--hex"]):
@@ -386,7 +392,7 @@ def on_terminal(data, **environment):
     return shown.decode().replace("\r\n", "\n")
 
 
-def case_colour_on_a_terminal_only():
+def test_colour_on_a_terminal_only():
     """Headings in bold, nothing else; none with NO_COLOR."""
     data = database("minimal")
     plain = expected_text("listing", "minimal")
@@ -425,7 +431,7 @@ TEXTS = [
 ]
 
 
-def case_texts_are_escaped():
+def test_texts_are_escaped():
     """Texts of any bytes, as default values, in the three forms."""
     source = (CASES / "listing" / "minimal.cdefsrc").read_bytes()
     for number, (octets, _, _) in enumerate(TEXTS):
@@ -441,7 +447,7 @@ def case_texts_are_escaped():
         expect(hidden, [], "characters that a terminal would act upon")
 
 
-def case_texts_of_several_lines():
+def test_texts_of_several_lines():
     """No source makes one, but a file may have it."""
     source = (CASES / "listing" / "minimal.cdefsrc").read_bytes()
     source += b"PersistentResourceAttribute\n\tName=A\n\tDescription=3\n\tDisplayName=4\n\tId=7\n"
@@ -452,7 +458,7 @@ def case_texts_of_several_lines():
            "one\ntwo", "JSON")
 
 
-def case_numbers_in_json():
+def test_numbers_in_json():
     """Integers are exact, floats have their digits, what JSON has no number for is text."""
     text = dump(database("types"), "--json")
     for number in ("-9223372036854775808", "18446744073709551615", "9007199254740993", "-9007199254740993"):
@@ -472,7 +478,7 @@ def case_numbers_in_json():
     ]), "floats")
 
 
-def case_class_hash():
+def test_class_hash():
     """The section that is never written, with two blocks."""
     image = cdb_image.Image("little", "little")
     image.sections.append((7, 0))
@@ -506,7 +512,7 @@ def case_class_hash():
         expect(names.count(name), 1, f"annotations {name!r} in {names[-8:]}")
 
 
-def case_sections_of_unused_types():
+def test_sections_of_unused_types():
     """They hold nothing that is known; the anchor is all there is to show."""
     image = cdb_image.Image("little", "little")
     for kind in (0, 1, 2):
@@ -519,7 +525,7 @@ def case_sections_of_unused_types():
     ), "sections")
 
 
-def case_annotated_values():
+def test_annotated_values():
     """Values, references and pieces of odd; its class is at 160 and the class's strings are 768 behind, at 3a0."""
     names = [name for _, _, name in regions_of(dump(database("odd"), "--hex"))]
     for name in (
@@ -541,7 +547,7 @@ def case_annotated_values():
     expect(names.count("section 4, var_id_t 1: 5"), 1, "variable IDs")
 
 
-def case_annotated_elements():
+def test_annotated_elements():
     """Elements of arrays, and of lists of valid values, are of their owners' types."""
     names = re.sub(r"(?m)^.{59}|\d+ at [0-9a-f]{8} ", "", dump(database("FileSystem"), "--hex"))
     for some in (
@@ -558,7 +564,7 @@ def case_annotated_elements():
         expect(names.count(lines), 1, f"lines {lines}")
 
 
-def case_annotated_bytes_are_in_proportion():
+def test_annotated_bytes_are_in_proportion():
     """A thousand names of one long text: each reference shows its beginning only."""
     name = "x" * 200
     lists = "".join(f"variety_list_t:g {i},{i}\n" for i in range(1000))
@@ -579,7 +585,7 @@ rsrc_class_t:1 u_rc_alias=none u_rc_pattrsC=224 u_rc_dattrsC=224 u_rc_pattrs=224
     expect(dump(data, status=TROUBLE), "cdef: -: not a sound database; 'cdef verify' says why\n", "listing")
 
 
-def case_value_of_another_type():
+def test_value_of_another_type():
     """A range that a class attribute's stanza left in a resource attribute: its numbers lead nowhere."""
     source = (CASES / "listing" / "minimal.cdefsrc").read_bytes()
     source += b"DynamicResourceAttribute\n\tName=Text\n\tDescription=3\n\tDisplayName=4\n\tId=7\n"
@@ -591,7 +597,7 @@ def case_value_of_another_type():
     expect(re.findall(r"ra_m.._value: .*", resource), ["ra_min_value: none", "ra_max_value: none"], "range")
 
 
-def case_shared_values_are_shown_once():
+def test_shared_values_are_shown_once():
     """Structures in such a range, each with the next one twice: 2 ** 40 of them, if one followed every reference."""
     levels = 40
     strings = 224 + 136 + 16
@@ -615,7 +621,7 @@ array SD 24
     expect(lines[start + 1 : start + 2 + 2 * levels], nested + again, "lines of the value")
 
 
-def case_attribute_cut_short():
+def test_attribute_cut_short():
     """A second class finds a String attribute open; its reference to valid values is 0, where another's numbers are."""
     attribute = b"PersistentResourceAttribute\n\tName=%s\n\tDescription=3\n\tDisplayName=4\n\tId=7\n\tDataType=%s\n"
     source = (CASES / "listing" / "minimal.cdefsrc").read_bytes()
@@ -628,50 +634,3 @@ def case_attribute_cut_short():
         "ra_dflt_value: 0", "u_ra_valid_vals", "vv_low_val: 8", "vv_high_val: 16",
         "ra_dflt_value: none", "u_ra_valid_vals: none",
     ], "values")
-
-
-# ---- Names of cases -------------------------------------------------------------------------------------------------
-
-
-def all_cases():
-    """Name and action of every case."""
-    listings = sorted(path.stem for path in CASES.glob("listing/*.txt"))
-    cases = {}
-    for kind, check, names in (
-        ("listing", check_listing, listings),
-        ("facts", check_facts, listings),
-        ("json", check_json, sorted(path.stem for path in CASES.glob("json/*.json"))),
-        ("offsets", check_offsets, sorted(path.stem for path in CASES.glob("offsets/*.txt"))),
-        ("hex", check_hex, sorted(path.stem for path in CASES.glob("hex/*.txt"))),
-        ("regions", check_regions, listings),
-    ):
-        for name in names:
-            cases[f"{kind}/{name}"] = lambda check=check, name=name: check(name)
-    for name, action in globals().items():
-        if name.startswith("case_"):
-            cases[name.removeprefix("case_").replace("_", "-")] = action
-    return cases
-
-
-def main():
-    """Run one case, or print the names of all."""
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--cdef", type=lambda text: str(pathlib.Path(text).resolve()))
-    parser.add_argument("--cdgen", type=lambda text: str(pathlib.Path(text).resolve()))
-    parser.add_argument("case", nargs="?")
-    global PROGRAMS
-    PROGRAMS = parser.parse_args()
-    cases = all_cases()
-    if not PROGRAMS.case:
-        print("\n".join(cases))
-        return 0
-    try:
-        cases[PROGRAMS.case]()
-    except Failure as problem:
-        print(f"FAIL {PROGRAMS.case}: {problem}")
-        return 1
-    return 0
-
-
-if __name__ == "__main__":
-    sys.exit(main())

@@ -1,8 +1,9 @@
 """Write sources with cdef source: what they look like, and that they compile back.
 
 A case is tests/cdef/source/NAME.cdefsrc, which is compiled, or NAME.image, a
-database described as cdb_image.py says; and beside it NAME.expect, the source
-that is expected, or NAME.error, the message of one that is refused.
+database described as cdb_image.py says; and beside it NAME.expect, in the
+notation of expectation.py: the status (default 0), and as stdout: the source
+that is expected, or as stderr: the message of one that is refused.
 
 Besides, whatever compiles must come back: the source of a database compiles to
 one that cdef diff calls identical, and the source of that one is the same
@@ -14,22 +15,22 @@ import os
 import pathlib
 import pty
 import subprocess
-import sys
 import tempfile
 
+import pytest
+
 import cdb_image
-import cdef_cases
 import cdef_sources
 import golden
-
-TESTS = pathlib.Path(__file__).parent
-sys.path.insert(0, str(TESTS / "image"))
-
-import make_images  # noqa: E402  (the path has to be set first)
+import make_images
+from compare import none, same
+from expectation import Expectation
+from programs import PROGRAMS, TESTS, environment
 
 CASES = TESTS / "cdef" / "source"
 GENERATED_GROUPS = 6
 GENERATED_EACH = 50
+PARTS = 2  # that run side by side
 TIMEOUT = 60
 TROUBLE = 2
 
@@ -41,14 +42,13 @@ SOURCE = "source"
 class Programs:
     """The two programs."""
 
-    def __init__(self, options):
-        self.cdgen, self.cdef = options.cdgen, options.cdef
+    def __init__(self):
+        self.cdgen, self.cdef = PROGRAMS.cdgen, PROGRAMS.cdef
 
     def run(self, directory, *command):
         """One run of a program."""
-        environment = {**os.environ, "VX_CDB_FORCE_EMPTY_TIMESTAMP": "", "LC_ALL": "C"}
         return subprocess.run(
-            command, cwd=directory, env=environment, stdin=subprocess.DEVNULL, capture_output=True, timeout=TIMEOUT
+            command, cwd=directory, env=environment(), stdin=subprocess.DEVNULL, capture_output=True, timeout=TIMEOUT
         )
 
     def compile(self, directory, source, out, swap):
@@ -99,7 +99,7 @@ def both_orders(programs, source, out="out.cdef"):
 
 def golden_sources():
     """(name, text, output file) of all sources that compile."""
-    for path in sorted((TESTS / "golden").rglob("*.expect")):
+    for path in golden.cases_below(TESTS / "golden"):
         case = golden.Case(path)
         if case.status == 0:
             yield path.stem, case.source.read_bytes(), case.out
@@ -305,20 +305,52 @@ def check_too_many_mixtures(programs):
     return problems + refusals(programs, "many", many, why)
 
 
-PROPERTIES = {
-    "choices-that-never-end": check_choices_that_never_end,
-    "too-many-mixtures": check_too_many_mixtures,
-    "sections-that-are-not-made": check_sections,
-    "optional-fields-of-an-attribute-without-a-type": check_optional_fields,
-    "on-a-terminal": check_terminal,
-    "what-is-tolerated-is-told": check_tolerated,
-    "all-golden-sources": lambda programs: check_sources(programs, golden_sources()),
-    "all-other-sources": lambda programs: check_sources(programs, plain_sources()),
-    **{
-        f"generated-sources-{group}": lambda programs, group=group: check_generated(programs, group)
-        for group in range(GENERATED_GROUPS)
-    },
-}
+@pytest.fixture
+def programs():
+    """The two programs."""
+    return Programs()
+
+
+def test_choices_that_never_end(programs):
+    none(check_choices_that_never_end(programs))
+
+
+def test_too_many_mixtures(programs):
+    none(check_too_many_mixtures(programs))
+
+
+def test_sections_that_are_not_made(programs):
+    none(check_sections(programs))
+
+
+def test_optional_fields_of_an_attribute_without_a_type(programs):
+    none(check_optional_fields(programs))
+
+
+def test_on_a_terminal(programs):
+    none(check_terminal(programs))
+
+
+def test_what_is_tolerated_is_told(programs):
+    none(check_tolerated(programs))
+
+
+@pytest.mark.slow(4)
+@pytest.mark.parametrize("part", range(PARTS))
+def test_all_golden_sources(programs, part):
+    none(check_sources(programs, list(golden_sources())[part::PARTS]))
+
+
+@pytest.mark.slow(4)
+@pytest.mark.parametrize("part", range(PARTS))
+def test_all_other_sources(programs, part):
+    none(check_sources(programs, list(plain_sources())[part::PARTS]))
+
+
+@pytest.mark.slow(2)
+@pytest.mark.parametrize("group", range(GENERATED_GROUPS))
+def test_generated_sources(programs, group):
+    none(check_generated(programs, group))
 
 
 # ---- Cases -----------------------------------------------------------------
@@ -334,33 +366,12 @@ def databases_of(programs, path):
         return [programs.compile(pathlib.Path(name), text, "out.cdef", swap)[0] for swap in (False, True)]
 
 
-def check_case(programs, path):
+@pytest.mark.parametrize("name", sorted(path.stem for path in CASES.glob("*.expect")))
+def test_case(programs, name):
     """The source or the message, for both byte orders."""
-    refused = path.with_suffix(".error").exists()
-    text = path.with_suffix(".error" if refused else ".expect").read_bytes()
-    expected = (TROUBLE, b"", text) if refused else (0, text, b"")
-    problems = []
-    for database in databases_of(programs, path):
-        with tempfile.TemporaryDirectory() as name:
-            result = programs.source(pathlib.Path(name), database)
-        actual = (result.returncode, result.stdout, result.stderr)
-        for part, want, got in zip(("status", "output", "message"), expected, actual):
-            if want != got:
-                problems.append(f"{part}:\n  expected {want!r}\n  actual   {got!r}")
-    return problems
-
-
-def names():
-    """All cases and properties."""
-    suffixes = (".expect", ".error")
-    return [*sorted(path.stem for path in CASES.iterdir() if path.suffix in suffixes), *PROPERTIES]
-
-
-def run(name, options):
-    """The problems of one case or property."""
-    programs = Programs(options)
-    return PROPERTIES[name](programs) if name in PROPERTIES else check_case(programs, CASES / f"{name}.x")
-
-
-if __name__ == "__main__":
-    sys.exit(cdef_cases.main(__doc__.splitlines()[0], names, run))
+    said = Expectation(CASES / f"{name}.expect", ("status",), ("stdout", "stderr"))
+    expected = (int(said.get("status", "0")), said.octets("stdout"), said.octets("stderr"))
+    for database in databases_of(programs, said.path):
+        with tempfile.TemporaryDirectory() as place:
+            result = programs.source(pathlib.Path(place), database)
+        same((result.returncode, result.stdout, result.stderr), expected, "status, output, message")

@@ -4,22 +4,19 @@ error in anything that the compiler makes.
 The images are those of image/make_images.py.
 """
 
-import argparse
 import json
 import os
 import pathlib
 import re
 import socket
 import subprocess
-import sys
 import tempfile
 import unittest
 
 import documents
 import golden
+from programs import PROGRAMS, TESTS
 
-OPTIONS = argparse.Namespace()
-HERE = pathlib.Path(__file__).resolve().parent
 
 WRONG = "broken/CDB301-class.little.cdef"
 WRONG_LINE = (
@@ -68,7 +65,7 @@ def verify(*operands, stdin=subprocess.DEVNULL, stdout=subprocess.PIPE, data=Non
     """Status, output and messages of `cdef verify`, run among the images."""
     given = {"input": data} if data is not None else {"stdin": stdin}
     result = subprocess.run(
-        [OPTIONS.cdef, "verify", *operands], cwd=OPTIONS.images, stdout=stdout, stderr=subprocess.PIPE, check=False,
+        [PROGRAMS.cdef, "verify", *operands], cwd=PROGRAMS.images, stdout=stdout, stderr=subprocess.PIPE, check=False,
         timeout=60, **given,
     )
     return result.returncode, (result.stdout or b"").decode(), result.stderr.decode()
@@ -143,7 +140,7 @@ class Json(unittest.TestCase):
 
     def test_document_names_the_keys(self):
         """In their order; a row may name several."""
-        chapter = dict(documents.chapters(HERE.parent / "docs" / "reader.md", 2))["cdef verify"]
+        chapter = dict(documents.chapters(TESTS.parent / "docs" / "reader.md", 2))["cdef verify"]
         of_file, of_finding = documents.tables(chapter)[-2:]
         for table, expected in ((of_file, self.parsed(0, SOUND)[0]), (of_finding, WRONG_FINDING)):
             self.assertEqual([key for row in table[1:] for key in documents.spans(row[0])], list(expected))
@@ -161,7 +158,7 @@ class Json(unittest.TestCase):
     def test_file_name_that_is_no_text(self):
         with tempfile.TemporaryDirectory() as directory:
             path = os.fsencode(directory) + b"/\xff.cdef"
-            pathlib.Path(os.fsdecode(path)).write_bytes((OPTIONS.images / SOUND).read_bytes())
+            pathlib.Path(os.fsdecode(path)).write_bytes((PROGRAMS.images / SOUND).read_bytes())
             status, text, messages = verify("--json", path)
             self.assertEqual((status, messages), (0, ""))
             self.assertIs(json.loads(text)[0]["sound"], True)
@@ -171,13 +168,13 @@ class Input(unittest.TestCase):
     """Standard input, and what cannot be read."""
 
     def test_standard_input(self):
-        with open(OPTIONS.images / WRONG, "rb") as file:
+        with open(PROGRAMS.images / WRONG, "rb") as file:
             self.assertEqual(verify("-", stdin=file), (1, WRONG_LINE.format("-"), ""))
 
     def test_standard_input_that_is_a_pipe(self):
-        data = (OPTIONS.images / WRONG).read_bytes()
+        data = (PROGRAMS.images / WRONG).read_bytes()
         self.assertEqual(verify("-", data=data), (1, WRONG_LINE.format("-"), ""))
-        self.assertEqual(verify("-", data=(OPTIONS.images / SOUND).read_bytes()), (0, "", ""))
+        self.assertEqual(verify("-", data=(PROGRAMS.images / SOUND).read_bytes()), (0, "", ""))
 
     def test_missing_file(self):
         self.assertEqual(verify("none.cdef"), (2, "", "cdef: none.cdef: No such file or directory\n"))
@@ -185,13 +182,13 @@ class Input(unittest.TestCase):
     def test_standard_input_that_is_a_socket(self):
         ours, theirs = socket.socketpair()
         with ours, theirs:
-            ours.sendall((OPTIONS.images / WRONG).read_bytes())
+            ours.sendall((PROGRAMS.images / WRONG).read_bytes())
             ours.shutdown(socket.SHUT_WR)
             self.assertEqual(verify("-", stdin=theirs), (1, WRONG_LINE.format("-"), ""))
 
     def test_standard_input_from_where_it_stands(self):
         with tempfile.TemporaryFile() as file:
-            file.write(b"front" + (OPTIONS.images / WRONG).read_bytes())
+            file.write(b"front" + (PROGRAMS.images / WRONG).read_bytes())
             file.flush()
             os.lseek(file.fileno(), len(b"front"), os.SEEK_SET)
             self.assertEqual(verify("-", stdin=file), (1, WRONG_LINE.format("-"), ""))
@@ -208,7 +205,7 @@ class Input(unittest.TestCase):
         self.assertEqual(verify("broken"), (2, "", "cdef: broken: Is a directory\n"))
 
     def test_standard_input_that_is_a_directory(self):
-        directory = os.open(OPTIONS.images, os.O_RDONLY)
+        directory = os.open(PROGRAMS.images, os.O_RDONLY)
         self.addCleanup(os.close, directory)
         self.assertEqual(verify("-", stdin=directory), (2, "", "cdef: -: Is a directory\n"))
 
@@ -228,9 +225,9 @@ class Input(unittest.TestCase):
     def test_name_that_looks_like_an_option(self):
         with tempfile.TemporaryDirectory() as directory:
             path = pathlib.Path(directory) / "-x.cdef"
-            path.write_bytes((OPTIONS.images / WRONG).read_bytes())
+            path.write_bytes((PROGRAMS.images / WRONG).read_bytes())
             result = subprocess.run(
-                [OPTIONS.cdef, "verify", "--", "-x.cdef"], cwd=directory, capture_output=True, check=False, timeout=60
+                [PROGRAMS.cdef, "verify", "--", "-x.cdef"], cwd=directory, capture_output=True, check=False, timeout=60
             )
             self.assertEqual((result.returncode, result.stdout.decode()), (1, WRONG_LINE.format("-x.cdef")))
 
@@ -240,21 +237,21 @@ class Input(unittest.TestCase):
         self.assertEqual(verify("-q", f"-{name}")[2], f"cdef: -{shown}: unknown option\nRun 'cdef --help' for more.\n")
         with tempfile.TemporaryDirectory() as directory:
             path = pathlib.Path(directory) / name
-            path.write_bytes((OPTIONS.images / WRONG).read_bytes())
+            path.write_bytes((PROGRAMS.images / WRONG).read_bytes())
             self.assertEqual(verify(path), (1, WRONG_LINE.format(f"{directory}/{shown}"), ""))
-            data = bytearray((OPTIONS.images / SOUND).read_bytes())
+            data = bytearray((PROGRAMS.images / SOUND).read_bytes())
             data[4] ^= 1
             path.write_bytes(data)
-            result = subprocess.run([OPTIONS.cdef, "diff", path, path], capture_output=True, check=False, timeout=60)
+            result = subprocess.run([PROGRAMS.cdef, "diff", path, path], capture_output=True, check=False, timeout=60)
         self.assertEqual(result.stderr.decode(), f"cdef: {directory}/{shown}: wrong checksum\n" * 2)
 
     def test_names_in_brackets(self):
         names = ["[x]", "[x,y]", "[]", "[[x]]", "[x", "x]", "./x]", "./x"]
         with tempfile.TemporaryDirectory() as directory:
             for name in names:
-                (pathlib.Path(directory) / name).write_bytes((OPTIONS.images / WRONG).read_bytes())
+                (pathlib.Path(directory) / name).write_bytes((PROGRAMS.images / WRONG).read_bytes())
             result = subprocess.run(
-                [OPTIONS.cdef, "verify", *names], cwd=directory, capture_output=True, text=True, check=False, timeout=60
+                [PROGRAMS.cdef, "verify", *names], cwd=directory, capture_output=True, text=True, check=False, timeout=60
             )
         expected = "".join(WRONG_LINE.format(name) for name in names)
         self.assertEqual((result.returncode, result.stdout, result.stderr), (1, expected, ""))
@@ -281,7 +278,7 @@ class Usage(unittest.TestCase):
     def test_help_ends_in_the_exit_statuses(self):
         for subcommand, statuses in {"verify": "012", "dump": "02", "diff": "012", "source": "02"}.items():
             result = subprocess.run(
-                [OPTIONS.cdef, subcommand, "--help"], capture_output=True, text=True, check=True, timeout=60
+                [PROGRAMS.cdef, subcommand, "--help"], capture_output=True, text=True, check=True, timeout=60
             )
             last = result.stdout.rstrip().rpartition("\n")[2]
             self.assertEqual(last[:13] + "".join(re.findall(r"\d", last)), "Exit status: " + statuses, result.stdout)
@@ -290,7 +287,7 @@ class Usage(unittest.TestCase):
         for arguments, message in self.MESSAGES.items():
             with self.subTest(arguments):
                 result = subprocess.run(
-                    [OPTIONS.cdef, *arguments], stdin=subprocess.DEVNULL, capture_output=True, text=True, check=False,
+                    [PROGRAMS.cdef, *arguments], stdin=subprocess.DEVNULL, capture_output=True, text=True, check=False,
                     timeout=60,
                 )
                 expected = (2, "", f"cdef: {message}\nRun 'cdef --help' for more.\n")
@@ -377,7 +374,7 @@ STRAY_RANGES = {
 
 def expected_warnings():
     """The codes of the warnings that each careless golden source is known for, by case."""
-    lines = (HERE / "cdef" / "verify" / "golden-warnings.txt").read_text().splitlines()
+    lines = (TESTS / "cdef" / "verify" / "golden-warnings.txt").read_text().splitlines()
     cases = [line.split(": ") for line in lines if line and not line.startswith("#")]
     return {name: codes.split() for name, codes in cases}
 
@@ -398,12 +395,12 @@ class Compiled(unittest.TestCase):
         sound = set()
         with tempfile.TemporaryDirectory() as directory:
             database = pathlib.Path(directory) / "made.cdef"
-            for path in golden.cases_of([HERE / "golden"]):
+            for path in golden.cases_below(TESTS / "golden"):
                 case = golden.Case(path)
                 for extra in ([], ["-s"]) if case.status == 0 else ():
-                    _, _, after = golden.run(case, OPTIONS.cdgen, extra)
+                    _, _, after = golden.run(case, PROGRAMS.cdgen, extra)
                     database.write_bytes(after[case.out])
-                    name = path.with_suffix("").relative_to(HERE / "golden").as_posix()
+                    name = path.with_suffix("").relative_to(TESTS / "golden").as_posix()
                     self.assertEqual(self.codes_of(database), expected.get(name, []), f"{name} {extra}")
                     sound.add(name)
         self.assertGreater(len(sound), 100)
@@ -413,12 +410,12 @@ class Compiled(unittest.TestCase):
         path = pathlib.Path(directory) / "made.cdefsrc"
         path.write_text(source)
         database = path.with_suffix(".cdef")
-        subprocess.run([OPTIONS.cdgen, *extra, path, database], check=True, stdout=subprocess.DEVNULL)
+        subprocess.run([PROGRAMS.cdgen, *extra, path, database], check=True, stdout=subprocess.DEVNULL)
         return database
 
     def test_examples_in_both_orders(self):
         with tempfile.TemporaryDirectory() as directory:
-            for source in sorted((HERE.parent / "examples").glob("*.cdefsrc")):
+            for source in sorted((TESTS.parent / "examples").glob("*.cdefsrc")):
                 for extra in ([], ["-s"]):
                     database = self.compile(source.read_text(), directory, extra)
                     self.assertEqual(verify("--werror", database), (0, "", ""), source)
@@ -429,18 +426,3 @@ class Compiled(unittest.TestCase):
                 for extra in ([], ["-s"]):
                     with self.subTest(name, extra=extra):
                         self.expect_sound(self.compile(source, directory, extra), name)
-
-
-def main():
-    """Run the tests with the programs named."""
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--cdef", type=pathlib.Path, required=True)
-    parser.add_argument("--cdgen", type=pathlib.Path, required=True)
-    parser.add_argument("--images", type=pathlib.Path, required=True, help="where make_images.py has put them")
-    _, rest = parser.parse_known_args(namespace=OPTIONS)
-    OPTIONS.cdef, OPTIONS.cdgen = OPTIONS.cdef.resolve(), OPTIONS.cdgen.resolve()
-    unittest.main(argv=[sys.argv[0], *rest])
-
-
-if __name__ == "__main__":
-    main()

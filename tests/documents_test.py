@@ -1,8 +1,4 @@
-#!/usr/bin/env python3
-"""Compiles what the documents, the manual pages and examples/ show, and holds made files against what makes them.
-
-    documents_test.py CDGEN LIST_NAMES
-"""
+"""Compiles what the documents, the manual pages and examples/ show, and holds made files against what makes them."""
 
 import datetime
 import pathlib
@@ -12,9 +8,9 @@ import sys
 import tempfile
 import unittest
 
+from programs import PROGRAMS, EXAMPLES
 from documents import DOCUMENTS, PAGES, PROJECT, broken_links, sources, tables, text_of
 
-CDGEN = LIST_NAMES = ""
 WITH_SOURCES = {"README.md", "language.md", "format.md", "cdgen.1", "cdefsrc.5", "cdb.5"}
 
 
@@ -32,7 +28,7 @@ class Sources(unittest.TestCase):
     def compile(self, source):
         with tempfile.TemporaryDirectory() as place:
             (pathlib.Path(place) / "a.cdefsrc").write_text(source)
-            done = subprocess.run([CDGEN, "a.cdefsrc", "a.cdef"], cwd=place, capture_output=True, text=True)
+            done = subprocess.run([PROGRAMS.cdgen, "a.cdefsrc", "a.cdef"], cwd=place, capture_output=True, text=True)
             self.assertEqual((done.returncode, done.stderr), (0, ""), source)
             return (pathlib.Path(place) / "a.cdef").read_bytes()
 
@@ -50,6 +46,16 @@ class Sources(unittest.TestCase):
             shown = [self.compile(re.sub(r"(?m)^ {8}", "\t", source)) for source in sources(PROJECT / "man" / page)]
             meant = [self.compile(source) for source in sources(PROJECT / "docs" / document)]
             self.assertEqual([len(image) for image in shown], [len(image) for image in meant], page)
+
+    def test_of_examples_compile(self):
+        for path in sorted(EXAMPLES.glob("*.cdefsrc")):
+            with self.subTest(path.name):
+                self.compile(path.read_text())
+
+    def test_of_examples_have_no_warnings(self):
+        done = subprocess.run([PROGRAMS.cdef, "check", "--werror", *sorted(EXAMPLES.glob("*.cdefsrc"))],
+                              capture_output=True, text=True)
+        self.assertEqual((done.returncode, done.stdout, done.stderr), (0, "", ""))
 
     def test_of_example_projects_compile(self):
         for path in sorted((PROJECT / "examples/projects").rglob("*.cdefsrc")):
@@ -121,11 +127,5 @@ class Made(unittest.TestCase):
             self.assertTrue((PROJECT / "man" / name).read_text() == text, f"{name}: run man/from_markdown.py")
 
     def test_editor_files_are_up_to_date(self):
-        for name, text in made_by("editors/generate.py", LIST_NAMES).items():
+        for name, text in made_by("editors/generate.py", PROGRAMS.list_names).items():
             self.assertTrue((PROJECT / "editors" / name).read_text() == text, f"{name}: run editors/generate.py")
-
-
-if __name__ == "__main__":
-    LIST_NAMES = sys.argv.pop(2)
-    CDGEN = sys.argv.pop(1)
-    unittest.main(verbosity=2)

@@ -1,11 +1,11 @@
 """Faults of the system: what the programs do when files fail them.
 
-Every case is a function below, named for what it shows.  Whatever happens, the
+Every test is a function below, named for what it shows.  Whatever happens, the
 program ends with a status of its own, never by a signal; and a fault before
 the output is opened leaves the output as it was.
 
 Run as root, cases about permissions give the program another user's.  A case
-that the machine does not allow (mounting) exits with 77 and says why.
+that the machine does not allow (mounting) is skipped and says why.
 """
 
 import errno
@@ -21,12 +21,14 @@ import subprocess
 import sys
 import termios
 
-import faults_mistakes
-from cases import ATTRIBUTE, BEFORE, BLOCK, HEAD, OUT, SKIPPED, SOURCE, TIMEOUT, Cases, Skip
+import pytest
+
+from cases import ATTRIBUTE, BEFORE, BLOCK, HEAD, OUT, SOURCE, TIMEOUT
 from cases import as_nobody, attributes, check, expect, limit, only_zeros
 
-case = Cases()
-case.functions.update(faults_mistakes.case.functions)
+
+
+MOUNT_REFUSED = 77  # a status that the program never has
 
 
 def of_errno(number):
@@ -45,41 +47,35 @@ def cannot_open(world, source, number, **more):
         expect(world.run(source, OUT, **more), number, message)
 
 
-@case
-def source_unreadable(world):
+def test_source_unreadable(world):
     """Nobody may read it."""
     os.chmod(world.path(SOURCE), 0)
     cannot_open(world, SOURCE, errno.EACCES, preexec_fn=as_nobody)
 
 
-@case
-def source_directory_unreadable(world):
+def test_source_directory_unreadable(world):
     """Nobody may look into its directory."""
     world.path("closed").mkdir(mode=0)
     cannot_open(world, "closed/" + SOURCE, errno.EACCES, preexec_fn=as_nobody)
 
 
-@case
-def source_below_a_file(world):
+def test_source_below_a_file(world):
     """Its directory is a file."""
     cannot_open(world, SOURCE + "/more", errno.ENOTDIR)
 
 
-@case
-def source_behind_a_loop_of_links(world):
+def test_source_behind_a_loop_of_links(world):
     """A symbolic link that leads to itself."""
     world.path("loop").symlink_to("loop")
     cannot_open(world, "loop", errno.ELOOP)
 
 
-@case
-def source_name_too_long(world):
+def test_source_name_too_long(world):
     """No file can be called so."""
     cannot_open(world, "x" * 5000, errno.ENAMETOOLONG)
 
 
-@case
-def source_is_a_socket(world):
+def test_source_is_a_socket(world):
     """Nothing that can be opened."""
     with socket.socket(socket.AF_UNIX) as listener:
         here = os.getcwd()
@@ -93,18 +89,16 @@ def needs_no_descriptors(world):
     """Skips what shared libraries, which have to be opened, keep from starting."""
     usage = world.run("-n", preexec_fn=limit(resource.RLIMIT_NOFILE, 3)).stderr
     if not usage.startswith(b"Usage: "):
-        raise Skip("the program needs descriptors to start: it is not static")
+        pytest.skip("the program needs descriptors to start: it is not static")
 
 
-@case
-def source_when_no_descriptor_is_free(world):
+def test_source_when_no_descriptor_is_free(world):
     """The three standard streams are all that may be open."""
     needs_no_descriptors(world)
     cannot_open(world, SOURCE, errno.EMFILE, preexec_fn=limit(resource.RLIMIT_NOFILE, 3))
 
 
-@case
-def source_when_only_a_standard_descriptor_is_free(world):
+def test_source_when_only_a_standard_descriptor_is_free(world):
     """A standard stream's place is not taken for the source."""
     needs_no_descriptors(world)
     script = f"exec 0<&- 3>&1; ulimit -n 4; exec ./cdgen {SOURCE} {OUT}"
@@ -112,16 +106,14 @@ def source_when_only_a_standard_descriptor_is_free(world):
     expect(result, errno.EMFILE, os.fsencode(SOURCE) + b": cannot open because: " + of_errno(errno.EMFILE) + b"\n")
 
 
-@case
-def two_free_descriptors_are_enough(world):
+def test_two_free_descriptors_are_enough(world):
     """One for the source, one for the output."""
     good = world.good()
     expect(world.run(preexec_fn=limit(resource.RLIMIT_NOFILE, 5)), 0)
     check(world.read() == good, "another database")
 
 
-@case
-def source_cannot_be_read(world):
+def test_source_cannot_be_read(world):
     """It opens, but reading fails."""
     world.write(OUT, BEFORE)
     message = b"/proc/self/mem: cannot read because: " + of_errno(errno.EIO) + b"\n"
@@ -129,21 +121,18 @@ def source_cannot_be_read(world):
         expect(world.run("/proc/self/mem", OUT), errno.EIO, message)
 
 
-@case
-def source_cannot_be_read_n(world):
+def test_source_cannot_be_read_n(world):
     """The same without a newline."""
     expect(world.run("-n", "/proc/self/mem", OUT), errno.EIO, b"/proc/self/mem: cannot read because: " + of_errno(errno.EIO))
 
 
-@case
-def source_is_a_directory(world):
+def test_source_is_a_directory(world):
     """A directory opens, but cannot be read."""
     expect(world.run(".", OUT), errno.EISDIR, b".: cannot read because: " + of_errno(errno.EISDIR) + b"\n")
     check(not world.path(OUT).exists(), "there is an output")
 
 
-@case
-def source_is_the_null_device(world):
+def test_source_is_the_null_device(world):
     """Nothing in it."""
     expect(world.run("/dev/null", OUT), 1, b"No classes defined\n")
 
@@ -159,15 +148,13 @@ def through_pipe(world, feed):
     return subprocess.CompletedProcess((), process.returncode, stdout, stderr)
 
 
-@case
-def source_is_a_pipe_that_closes_at_once(world):
+def test_source_is_a_pipe_that_closes_at_once(world):
     """Nothing comes."""
     expect(through_pipe(world, lambda descriptor, process: None), 1, b"No classes defined\n")
     check(not world.path(OUT).exists(), "there is an output")
 
 
-@case
-def source_is_a_pipe_that_closes_too_early(world):
+def test_source_is_a_pipe_that_closes_too_early(world):
     """Half of it comes, up to the middle of a line."""
     half = HEAD[: HEAD.index(b"\tMessageCatalog") - 2]
     good = world.good(half)
@@ -175,8 +162,7 @@ def source_is_a_pipe_that_closes_too_early(world):
     check(world.read() == good, "not what the same half in a file gives")
 
 
-@case
-def source_comes_byte_by_byte(world):
+def test_source_comes_byte_by_byte(world):
     """Reads that return less than was asked for."""
     good = world.good()
 
@@ -188,8 +174,7 @@ def source_comes_byte_by_byte(world):
     check(world.read() == good, "another database")
 
 
-@case
-def source_vanishes_while_the_program_sleeps(world):
+def test_source_vanishes_while_the_program_sleeps(world):
     """Stopped and continued in the middle of a pipe that has lost its name."""
     good = world.good()
 
@@ -221,8 +206,7 @@ def while_read(world, source, change):
     return process.returncode, stderr
 
 
-@case
-def source_deleted_while_read(world):
+def test_source_deleted_while_read(world):
     """A file lives on while it is open."""
     source = HEAD + attributes(5000)
     good = world.good(source)
@@ -230,8 +214,7 @@ def source_deleted_while_read(world):
     check(world.read() == good, "another database")
 
 
-@case
-def source_grows_while_read(world):
+def test_source_grows_while_read(world):
     """What comes in time belongs to the source."""
     source = HEAD + attributes(5000)
     more = ATTRIBUTE % (9999, 9999, 9999)
@@ -245,8 +228,7 @@ def source_grows_while_read(world):
     check(world.read() == good, "another database")
 
 
-@case
-def source_shortened_while_read(world):
+def test_source_shortened_while_read(world):
     """What is read of it decides; in the middle of an attribute it is refused."""
     world.write(OUT, BEFORE)
     status, stderr = while_read(world, HEAD + attributes(5000), lambda path: os.truncate(path, 0))
@@ -258,8 +240,7 @@ def source_shortened_while_read(world):
         check(world.read() == BEFORE, "the output was touched")
 
 
-@case
-def source_shortened_to_whole_stanzas_while_read(world):
+def test_source_shortened_to_whole_stanzas_while_read(world):
     """What is left is all of it."""
     left = HEAD + attributes(2000)
     good = world.good(left)
@@ -269,8 +250,7 @@ def source_shortened_to_whole_stanzas_while_read(world):
     world.verified()
 
 
-@case
-def database_unreadable(world):
+def test_database_unreadable(world):
     """Nobody may read what cdef is to verify."""
     world.write(OUT, world.good())
     os.chmod(world.path(OUT), 0)
@@ -287,40 +267,34 @@ def cannot_create(world, out, number, **more):
     expect(world.run(SOURCE, out, **more), 1, b"Cannot create CDB file: " + of_errno(number) + b"\n")
 
 
-@case
-def output_directory_read_only(world):
+def test_output_directory_read_only(world):
     """Nobody may create files there."""
     world.path("closed").mkdir(mode=0o555)
     cannot_create(world, "closed/" + OUT, errno.EACCES, preexec_fn=as_nobody)
     check(not list(world.path("closed").iterdir()), "something was created")
 
 
-@case
-def output_directory_missing(world):
+def test_output_directory_missing(world):
     """There is no such directory."""
     cannot_create(world, "missing/" + OUT, errno.ENOENT)
 
 
-@case
-def output_below_a_file(world):
+def test_output_below_a_file(world):
     """Its directory is a file."""
     cannot_create(world, SOURCE + "/" + OUT, errno.ENOTDIR)
 
 
-@case
-def output_name_empty(world):
+def test_output_name_empty(world):
     """No name at all."""
     cannot_create(world, "", errno.ENOENT)
 
 
-@case
-def output_name_too_long(world):
+def test_output_name_too_long(world):
     """No file can be called so."""
     cannot_create(world, "x" * 300, errno.ENAMETOOLONG)
 
 
-@case
-def output_read_only(world):
+def test_output_read_only(world):
     """A database that nobody may change stays."""
     world.write(OUT, BEFORE)
     os.chmod(world.path(OUT), 0o444)
@@ -328,23 +302,20 @@ def output_read_only(world):
         cannot_create(world, OUT, errno.EACCES, preexec_fn=as_nobody)
 
 
-@case
-def output_is_a_directory(world):
+def test_output_is_a_directory(world):
     """A directory is no output, and stays."""
     world.path(OUT).mkdir()
     cannot_create(world, OUT, errno.EISDIR)
     check(world.path(OUT).is_dir(), "the directory is gone")
 
 
-@case
-def output_behind_a_loop_of_links(world):
+def test_output_behind_a_loop_of_links(world):
     """A symbolic link that leads to itself."""
     world.path(OUT).symlink_to(OUT)
     cannot_create(world, OUT, errno.ELOOP)
 
 
-@case
-def output_is_a_full_device(world):
+def test_output_is_a_full_device(world):
     """Nothing can be written."""
     cannot_create(world, "/dev/full", errno.ENOSPC)
 
@@ -356,23 +327,20 @@ def cannot_map(world, out):
     check(re.fullmatch(rb"Cannot map CDB file: [^\n]+\n", result.stderr), result.stderr)
 
 
-@case
-def output_is_a_pipe(world):
+def test_output_is_a_pipe(world):
     """It must not wait for a reader; the pipe stays."""
     os.mkfifo(world.path(OUT))
     cannot_map(world, OUT)
     check(stat.S_ISFIFO(os.stat(world.path(OUT)).st_mode), "the pipe is gone")
 
 
-@case
-def output_is_the_null_device(world):
+def test_output_is_the_null_device(world):
     """The device stays."""
     cannot_map(world, "/dev/null")
     check(stat.S_ISCHR(os.stat("/dev/null").st_mode), "the device is gone")
 
 
-@case
-def output_is_a_link(world):
+def test_output_is_a_link(world):
     """A symbolic link is followed, and stays."""
     good = world.good()
     world.write("target", BEFORE * 1000)
@@ -381,8 +349,7 @@ def output_is_a_link(world):
     check(world.path(OUT).is_symlink() and world.read("target") == good, "not written through the link")
 
 
-@case
-def output_is_a_link_to_nothing(world):
+def test_output_is_a_link_to_nothing(world):
     """What it leads to is created."""
     good = world.good()
     world.path(OUT).symlink_to("target")
@@ -390,16 +357,14 @@ def output_is_a_link_to_nothing(world):
     check(world.path(OUT).is_symlink() and world.read("target") == good, "not written through the link")
 
 
-@case
-def output_is_a_link_to_the_source(world):
+def test_output_is_a_link_to_the_source(world):
     """The source is never overwritten."""
     world.path(OUT).symlink_to(SOURCE)
     expect(world.run(), 1, b"Cannot create CDB file: it is the source file\n")
     check(world.read(SOURCE) == HEAD, "the source was touched")
 
 
-@case
-def output_takes_the_traces(world):
+def test_output_takes_the_traces(world):
     """Traces in a database would damage it; without them, nothing is written to the streams."""
     for stream in ("stdout", "stderr"):
         world.write(OUT, BEFORE)
@@ -412,15 +377,13 @@ def output_takes_the_traces(world):
         check(world.read() == world.good(), "another database")
 
 
-@case
-def new_output_has_its_mode(world):
+def test_new_output_has_its_mode(world):
     """Mode 0644 but for the umask."""
     expect(world.run(preexec_fn=lambda: os.umask(0o026)), 0)
     check(stat.S_IMODE(os.stat(world.path(OUT)).st_mode) == 0o640, oct(os.stat(world.path(OUT)).st_mode))
 
 
-@case
-def replaced_output_keeps_its_mode_and_links(world):
+def test_replaced_output_keeps_its_mode_and_links(world):
     """It is written in place."""
     good = world.good()
     world.write(OUT, BEFORE)
@@ -431,8 +394,7 @@ def replaced_output_keeps_its_mode_and_links(world):
     check(stat.S_IMODE(os.stat(world.path(OUT)).st_mode) == 0o600, "another mode")
 
 
-@case
-def file_size_limit(world):
+def test_file_size_limit(world):
     """A file that may not grow: an error of the call, no signal; the least limit that is enough."""
     good = world.good(HEAD + attributes(50))
     gross = -(-len(good) // BLOCK) * BLOCK
@@ -444,21 +406,16 @@ def file_size_limit(world):
     check(world.read() == good, "another database")
 
 
-@case
-def file_system_full(world):
+def test_file_system_full(world):
     """A file system of 16 KB and a database of more."""
     world.write(SOURCE, HEAD + attributes(500))
     world.path("small").mkdir()
-    script = 'mount -t tmpfs -o size=16k none small || exit 77; "$@"; status=$?; tr -d "\\0" <small/out.cdef; exit $status'
+    script = 'mount -t tmpfs -o size=16k none small || exit %d; "$@"; status=$?; tr -d "\\0" <small/out.cdef; exit $status' % MOUNT_REFUSED
     user = [] if os.geteuid() == 0 else ["-r"]
     command = ["unshare", *user, "-m", "sh", "-c", script, "sh", world.program, SOURCE, "small/" + OUT]
     if shutil.which("unshare") is None:
-        raise Skip("no unshare(1) here")
+        pytest.skip("no unshare(1) here")
     result = subprocess.run(command, capture_output=True, timeout=TIMEOUT, **world.options())
-    if result.returncode == SKIPPED or b"unshare:" in result.stderr:
-        raise Skip("mounting is not allowed here: " + result.stderr.decode())
+    if result.returncode == MOUNT_REFUSED or b"unshare:" in result.stderr:
+        pytest.skip("mounting is not allowed here: " + result.stderr.decode())
     expect(result, 1, b"Cannot create CDB file: " + of_errno(errno.ENOSPC) + b"\n")
-
-
-if __name__ == "__main__":
-    sys.exit(case.main(__doc__))

@@ -1,7 +1,7 @@
-"""Run the golden cases: one source, one expectation beside it.
+"""Golden cases: one source, one expectation beside it.
 
 A case is NAME.cdefsrc with NAME.expect (the expectation alone when the case
-needs no source).  The expectation holds 'key: value' lines:
+needs no source), in the notation of expectation.py.  Its keys:
 
     args:      options put before the operands
     out:       name of the output file (default out.cdef)
@@ -10,31 +10,30 @@ needs no source).  The expectation holds 'key: value' lines:
     setup:     mkdir NAME | file NAME TEXT | symlink TARGET NAME | hardlink TARGET NAME
     message:   free: one line on stderr whose wording no rule fixes
 
-and blocks of lines that begin with '|': stdout:, stderr:, and the same with
-'-no-newline' for a last line without one.  A stream without a block must stay
-empty.  'image:' starts the description of the file (see cdb_image.py);
-'image-little:' and 'image-big:' state the file's bytes in hexadecimal.  The
-image blocks run to the next 'image...:' line or the end.
+and its blocks, stdout: and stderr:.  A stream without a block must stay empty.
+'image:' starts the description of the file (see cdb_image.py); 'image-little:'
+and 'image-big:' state the file's bytes in hexadecimal.
 
 Every case runs in a fresh directory, with the program reached as ./cdgen, so
 that messages that name the program or a file are the same everywhere.  A
-failing run must leave the directory's files as they were.
+failing run must leave the directory's files as they were.  CDGEN_RUNNER in the
+environment is a command that runs the program, valgrind or an emulator.
 """
 
-import argparse
 import os
 import pathlib
-import re
 import shlex
 import subprocess
-import sys
 import tempfile
 
 import cdb_image
+import compare
+import programs
 import reverse_cdb
+from expectation import Expectation
 
 KEYS = {"args", "out", "operands", "status", "setup", "message"}
-BLOCKS = {"stdout", "stderr", "stdout-no-newline", "stderr-no-newline"}
+STREAMS = {"stdout", "stderr"}
 IMAGES = {"image", "image-little", "image-big"}
 TIMEOUT = 60
 REPORT_LINES = 25
@@ -46,40 +45,11 @@ class Case:
     def __init__(self, path):
         self.expect = path.with_suffix(".expect")
         self.source = path.with_suffix(".cdefsrc")
-        self.name = self.expect.with_suffix("").as_posix()
-        self.keys = {}
-        self.setup = []
-        self.streams = {"stdout": b"", "stderr": b""}
-        self.images = {}
-        self.parse(self.expect.read_bytes().decode())
-
-    def parse(self, text):
-        """Read the expectation; an unknown key is an error in the case."""
-        block, image = None, None
-        collected = {}
-        for line in text.split("\n"):
-            key, _, value = line.partition(":")
-            if key in IMAGES and not value.strip():
-                image, block = key, None
-                self.images[image] = []
-            elif image:
-                self.images[image].append(line)
-            elif line.startswith("|"):
-                collected[block].append(line[1:])
-            elif key in BLOCKS and not value:
-                block = key
-                collected[block] = []
-            elif key == "setup":
-                self.setup.append(shlex.split(value))
-            elif key in KEYS:
-                self.keys[key] = value.strip()
-            elif line.strip() and not line.startswith("#"):
-                raise ValueError(f"{self.expect}: cannot read {line!r}")
-        for block, lines in collected.items():
-            stream = block.removesuffix("-no-newline")
-            ending = "" if block != stream else "\n"
-            self.streams[stream] = ("\n".join(lines) + ending).encode()
-        self.images = {key: "\n".join(lines) for key, lines in self.images.items()}
+        said = Expectation(self.expect, KEYS, STREAMS, IMAGES)
+        self.keys = {key: said.get(key) for key in KEYS - {"setup"} if said.has(key)}
+        self.setup = [shlex.split(text) for _, text in said.all("setup")]
+        self.streams = {stream: said.octets(stream) for stream in STREAMS}
+        self.images = {key: said.get(key) for key in IMAGES if said.has(key)}
 
     @property
     def status(self):
@@ -98,6 +68,14 @@ class Case:
         if "image" in self.images:
             return cdb_image.assemble_labelled(self.images["image"], order, native, self.expect.parent)
         return None
+
+
+class Source(Case):
+    """A plain source, which has no expectation beside it."""
+
+    def __init__(self, path):
+        self.expect, self.source = path, path.with_suffix(".cdefsrc")
+        self.keys, self.setup, self.images = {}, [], {}
 
 
 def set_up(case, directory):
@@ -134,23 +112,21 @@ def run(case, program, extra):
         operands = [case.source.name, case.out]
     command = shlex.split(os.environ.get("CDGEN_RUNNER", ""))
     command += ["./cdgen", *extra, *shlex.split(case.keys.get("args", "")), *operands]
-    environment = {**os.environ, "VX_CDB_FORCE_EMPTY_TIMESTAMP": "", "LC_ALL": "C"}
     with tempfile.TemporaryDirectory() as name:
         directory = pathlib.Path(name)
         (directory / "cdgen").symlink_to(program)
         set_up(case, directory)
         before = snapshot(directory)
         result = subprocess.run(
-            command, cwd=directory, env=environment, stdin=subprocess.DEVNULL, capture_output=True, timeout=TIMEOUT
+            command, cwd=directory, env=programs.environment(), stdin=subprocess.DEVNULL, capture_output=True,
+            timeout=TIMEOUT,
         )
         return result, before, snapshot(directory)
 
 
 def compare_stream(name, expected, actual):
     """The difference of one output stream, as report lines."""
-    if expected == actual:
-        return []
-    return [f"{name} differs:", f"  expected {expected!r}", f"  actual   {actual!r}"]
+    return [f"{name} differs:", *compare.difference(actual, expected)] if expected != actual else []
 
 
 def compare_stderr(case, actual):
@@ -210,12 +186,11 @@ def check_run(case, program, extra, order, native):
     return problems, written
 
 
-def check_case(case, options):
-    """Every run that a case needs; its problems."""
-    native = options.native
-    problems, written = check_run(case, options.cdgen, [], native, native)
-    if options.swap and case.status == 0 and written is not None:
-        more, reversed_file = check_run(case, options.cdgen, ["-s"], cdb_image.other(native), native)
+def check_case(case, program, native):
+    """Every run that a case needs, with -s too if it compiles; the problems."""
+    problems, written = check_run(case, program, [], native, native)
+    if case.status == 0 and written is not None:
+        more, reversed_file = check_run(case, program, ["-s"], cdb_image.other(native), native)
         problems += [f"with -s: {line}" for line in more]
         turned = reverse_cdb.reverse(written)
         if reversed_file is not None and turned != reversed_file:
@@ -241,43 +216,7 @@ def check_notation(case):
     return problems
 
 
-def cases_of(paths):
-    """The cases named on the command line, or below its directories."""
-    for path in map(pathlib.Path, paths):
-        if path.is_dir():
-            found = {item.with_suffix(".expect") for item in path.rglob("*") if re.search(r"\.(expect|cdefsrc)$", item.name)}
-            yield from sorted(found)
-        else:
-            yield path
-
-
-def main():
-    """Run the cases and print the count."""
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--cdgen", type=lambda text: pathlib.Path(text).resolve(), help="the program to run")
-    parser.add_argument("--swap", action="store_true", help="check option -s on every case that compiles")
-    parser.add_argument("--native", choices=("little", "big"), default="little", help="byte order of the program")
-    parser.add_argument("--keep-going", action="store_true", help="do not stop at the first failure")
-    parser.add_argument("--check-notation", action="store_true", help="only assemble the cases' images")
-    parser.add_argument("cases", nargs="+")
-    options = parser.parse_args()
-    if not options.check_notation and not options.cdgen:
-        parser.error("--cdgen PATH is needed")
-    passed = failed = 0
-    for path in cases_of(options.cases):
-        try:
-            case = Case(path)
-            problems = check_notation(case) if options.check_notation else check_case(case, options)
-        except (OSError, ValueError, KeyError, cdb_image.NotationError, subprocess.TimeoutExpired) as problem:
-            problems = [repr(problem)]
-        passed, failed = passed + (not problems), failed + bool(problems)
-        if problems:
-            print(f"FAIL {path}", *problems, sep="\n    ")
-            if not options.keep_going:
-                break
-    print(f"{passed} passed, {failed} failed")
-    return 1 if failed else 0
-
-
-if __name__ == "__main__":
-    sys.exit(main())
+def cases_below(directory):
+    """The paths of all cases below a directory."""
+    found = {item.with_suffix(".expect") for item in directory.rglob("*") if item.suffix in (".expect", ".cdefsrc")}
+    return sorted(found)

@@ -1,12 +1,14 @@
 """Limits: what is allowed up to a number, and what happens at the next one.
 
-Every case is a function below, or a row of a table, named for the limit.
+Every test is a function below, or a row of a table, named for the limit.
 """
 
 import struct
 import sys
 
-from cases import HEAD, LINE, OUT, SOURCE, Cases, attributes, check, expect
+import pytest
+
+from cases import HEAD, LINE, OUT, SOURCE, attributes, check, expect
 
 MARK = "<" if sys.byteorder == "little" else ">"
 COUNT_MAX = 65535
@@ -16,9 +18,7 @@ CLASS = 5  # a section's type
 VARIABLE_CLASS = 4
 TURNED = "turned.cdef"
 NONE = "none.cdef"  # what never comes to be
-
-case = Cases()
-
+ROWS = {}  # tests that tables give, by name
 
 class Image:
     """As much of a database as the cases look at."""
@@ -74,9 +74,9 @@ def refused(world, source, message):
 
 
 def named(name, function):
-    """Registers a case that a table gives."""
-    check(name not in case.functions, "two cases are called", name)
-    case.functions[name] = function
+    """Registers a row of a table as a test."""
+    check(name not in ROWS, "two rows are called", name)
+    ROWS[name] = function
 
 
 # ---- Records of a kind -------------------------------------------------------
@@ -127,8 +127,7 @@ for a_kind in KINDS:
 ONE = b"PersistentResourceAttribute\n" + REQUIRED.encode() % 1 + b"\tDataType=%s\n" + VARIETY.encode()
 
 
-@case
-def varieties_65537_in_a_list(world):
+def test_varieties_65537_in_a_list(world):
     """Counted in 32 bits."""
     lines = b"".join(b"\tVarietyRange=%d,%d\n" % (i, i) for i in range(2, COUNT_MAX + 3))
     image = compiled(world, HEAD + ONE % b"Int32" + lines)
@@ -137,8 +136,7 @@ def varieties_65537_in_a_list(world):
     check(last == (COUNT_MAX + 2, COUNT_MAX + 2), last)
 
 
-@case
-def valid_values_65537_in_a_list(world):
+def test_valid_values_65537_in_a_list(world):
     """Counted in 32 bits."""
     lines = b"".join(b"\tValidValue=%d\n" % i for i in range(COUNT_MAX + 2))
     image = compiled(world, HEAD + ONE % b"UInt64" + lines)
@@ -147,8 +145,7 @@ def valid_values_65537_in_a_list(world):
     check(last == (COUNT_MAX + 1, COUNT_MAX + 1), last)
 
 
-@case
-def elements_65537_in_an_array(world):
+def test_elements_65537_in_an_array(world):
     """Counted in 32 bits, of which the cell has the place."""
     lines = b"".join(b"\tDefaultValue=%d\n" % i for i in range(COUNT_MAX + 2))
     image = compiled(world, HEAD + ONE % b"UInt32Array" + lines)
@@ -157,8 +154,7 @@ def elements_65537_in_an_array(world):
     check(image.in_table(STRINGS, place + 8 + 8 * (COUNT_MAX + 1), "I") == (COUNT_MAX + 1,), "the last element")
 
 
-@case
-def elements_65537_in_a_structure(world):
+def test_elements_65537_in_a_structure(world):
     """Counted in 32 bits; of the highest index the attribute has the low 16."""
     element = "PAttrSDDefinition\n\tElementName=e\n\tDescription=1\n\tDisplayName=2\n\tElementIndex=%d\n\tDataType=UInt32\n"
     run = "".join(element % i for i in range(COUNT_MAX + 2)).encode()
@@ -169,8 +165,7 @@ def elements_65537_in_a_structure(world):
     check(image.in_table(STRINGS, place, "I") == (COUNT_MAX + 2,), image.in_table(STRINGS, place, "I"))
 
 
-@case
-def classes_1000_in_a_file(world):
+def test_classes_1000_in_a_file(world):
     """Each is a section of its own."""
     image = compiled(world, b"ControlDefinition\n\tFileVersion=1\n" * 999 + HEAD)
     check(len(image.of_type(CLASS)) == 1000, len(image.of_type(CLASS)))
@@ -194,22 +189,19 @@ def ids_of(image):
         yield image.get(at + 40 + strings, f"{count}I")
 
 
-@case
-def variable_classes_100_with_ids(world):
+def test_variable_classes_100_with_ids(world):
     """As many as may have IDs, each its own."""
     found = list(ids_of(compiled(world, groups(GROUPS_MAX, GROUPS_MAX))))
     check(found == [(i + 7,) for i in range(GROUPS_MAX)], found)
 
 
-@case
-def variable_classes_101_with_ids(world):
+def test_variable_classes_101_with_ids(world):
     """One more is refused."""
     message = b"Too many variable classes with dynamic attributes (100 at most)\n"
     refused(world, groups(GROUPS_MAX + 1, GROUPS_MAX + 1), message)
 
 
-@case
-def variable_classes_1000_of_which_100_have_ids(world):
+def test_variable_classes_1000_of_which_100_have_ids(world):
     """The others do not count."""
     found = list(ids_of(compiled(world, groups(1000, GROUPS_MAX))))
     check(found == [(i + 7,) for i in range(GROUPS_MAX)] + [()] * 900, found)
@@ -310,36 +302,31 @@ def stored_name(image):
     return image.contents[at : image.contents.index(b"\0", at)]
 
 
-@case
-def line_of_253_characters(world):
+def test_line_of_253_characters(world):
     """It is whole, and counts as one."""
     source, name = with_name(LINE)
     check(stored_name(compiled(world, source)) == name, "another name")
     refused(world, source + b"X\n", b"%d: Invalid table name: X\n" % (source.count(b"\n") + 1))
 
 
-@case
-def line_of_254_characters(world):
+def test_line_of_254_characters(world):
     """Its newline is a line of its own."""
     source, name = with_name(LINE + 1)
     check(stored_name(compiled(world, source)) == name, "another name")
     refused(world, source + b"X\n", b"%d: Invalid table name: X\n" % (source.count(b"\n") + 2))
 
 
-@case
-def line_of_255_characters(world):
+def test_line_of_255_characters(world):
     """Its last character is a header."""
     refused(world, with_name(LINE + 2)[0], b"18: Invalid table name: N\n")
 
 
-@case
-def line_of_256_characters(world):
+def test_line_of_256_characters(world):
     """Its last two characters are a header."""
     refused(world, with_name(LINE + 3)[0], b"18: Invalid table name: NN\n")
 
 
-@case
-def line_whose_rest_is_an_attribute(world):
+def test_line_whose_rest_is_an_attribute(world):
     """It begins with a blank."""
     source, name = with_name(LINE + 1, b" Description=9")
     source = source.replace(b"\tDescription=1\n\tDisplayName=2\n\tId", b"\tDisplayName=2\n\tId")
@@ -347,41 +334,35 @@ def line_whose_rest_is_an_attribute(world):
     check(stored_name(image) == name and image.in_table(PATTRS, 16, "H") == (9,), "another attribute")
 
 
-@case
-def header_of_254_characters(world):
+def test_header_of_254_characters(world):
     """With blanks up to the end, which are no text."""
     header = b"ClassToManagerMapping"
     compiled(world, HEAD.replace(header, header.ljust(LINE + 1)))
 
 
-@case
-def no_final_newline(world):
+def test_no_final_newline(world):
     """The last line counts all the same."""
     image = compiled(world, HEAD).contents
     check(compiled(world, HEAD[:-1]).contents == image, "another database")
 
 
-@case
-def empty_file(world):
+def test_empty_file(world):
     """Nothing is a source without a class."""
     refused(world, b"", b"No classes defined\n")
 
 
-@case
-def one_newline(world):
+def test_one_newline(world):
     """An empty line is no more."""
     refused(world, b"\n", b"No classes defined\n")
 
 
-@case
-def only_nuls(world):
+def test_only_nuls(world):
     """Lines that end before they begin."""
     for count in (1, LINE + 1, LINE + 2, 100000):
         refused(world, bytes(count), b"No classes defined\n")
 
 
-@case
-def carriage_returns(world):
+def test_carriage_returns(world):
     """They belong to the text."""
     refused(world, HEAD.replace(b"\n", b"\r\n"), b"1: Invalid table name: ControlDefinition\r\n")
 
@@ -394,51 +375,46 @@ def filled(line):
     return line * (LARGE // len(line))
 
 
-@case
-def large_of_comments(world):
+def test_large_of_comments(world):
     """100 MB of comments change nothing."""
     good = compiled(world, HEAD).contents
     check(compiled(world, filled(b"# nothing of interest\n") + HEAD).contents == good, "another database")
 
 
-@case
-def large_of_newlines(world):
+def test_large_of_newlines(world):
     """The line number goes as far."""
     refused(world, b"\n" * LARGE + b"X", b"%d: Invalid table name: X\n" % (LARGE + 1))
 
 
-@case
-def large_of_one_line(world):
+def test_large_of_one_line(world):
     """A comment of 100 MB, whose second part is a header."""
     refused(world, b"#" + b"x" * LARGE, b"2: Invalid table name: %s\n" % (b"x" * (LINE + 1)))
 
 
-@case
-def large_of_blanks(world):
+def test_large_of_blanks(world):
     """A line of 100 MB that holds nothing."""
     refused(world, b" " * LARGE, b"No classes defined\n")
 
 
-@case
-def large_of_nuls(world):
+def test_large_of_nuls(world):
     """A file that was never written."""
     refused(world, bytes(LARGE), b"No classes defined\n")
 
 
-@case
-def large_of_values(world):
+def test_large_of_values(world):
     """100 MB of valid values of one attribute, all of them stored."""
     line = b"\tValidValue=1000000000000000000,2000000000000000000\n"
     image = compiled(world, HEAD + ONE % b"UInt64" + filled(line))
     check(image.in_table(VALID_VALUES, 4, "I") == (LARGE // len(line),), image.in_table(VALID_VALUES, 4, "I"))
 
 
-@case
-def large_of_attributes(world):
+def test_large_of_attributes(world):
     """As many attributes as there may be, with long texts."""
     source = HEAD + attributes(COUNT_MAX).replace(b"The default", b"The default" + b"t" * 150)
     check(compiled(world, source).in_class(COUNTS, "6H") == (0, 0, COUNT_MAX, 0, 0, 0), "counts")
 
 
-if __name__ == "__main__":
-    sys.exit(case.main(__doc__))
+@pytest.mark.parametrize("row", ROWS)
+def test_row(row, world):
+    """A row of a table above."""
+    ROWS[row](world)

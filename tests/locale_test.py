@@ -1,13 +1,12 @@
 """The programs under a locale whose numbers have commas: nothing that they read or write changes.
 
-Every case is a function below, named for what is read or written.
+Every test is a function below, named for what is read or written.
 """
 
 import subprocess
-import sys
 
 import german
-from cases import HEAD, OUT, SOURCE, TIMEOUT, Cases, check, expect
+from cases import HEAD, OUT, SOURCE, TIMEOUT, check, expect
 
 NUMBERS = b"""\
 PersistentResourceAttribute
@@ -35,17 +34,13 @@ SOURCE_OF_NUMBERS = HEAD + b"".join(
     NUMBERS % (i, i, name, i, i + 10, name) for i, name in enumerate((b"Float32", b"Float64", b"Float32Array", b"Float64Array"))
 )
 
-case = Cases()
-
-
 def elsewhere(world):
     """How a process is started under that locale."""
     options = world.options()
     return {**options, "env": {**options["env"], **german.environment(world.locales)}}
 
 
-@case
-def databases(world):
+def test_databases(world):
     """What cdgen makes of floating point."""
     good = world.good(SOURCE_OF_NUMBERS)
     command = [world.program, SOURCE, OUT]
@@ -63,30 +58,22 @@ def inspected(world, *arguments):
     return result
 
 
-@case
-def text(world):
+def test_text(world):
     """Of each number."""
     check(b"99.5" in inspected(world, "dump", OUT).stdout, "the number is not in it")
 
 
-@case
-def json(world):
+def test_json(world):
     """Of each number."""
     check(b"99.5" in inspected(world, "dump", "--json", OUT).stdout, "the number is not in it")
 
 
-@case
-def sources(world):
+def test_sources(world):
     """Made of a database."""
     check(b"Range=0.75,99.5" in inspected(world, "source", OUT).stdout, "the number is not in it")
 
 
-@case
-def findings(world):
+def test_findings(world):
     """Of a database and of a source, which have none."""
     inspected(world, "verify", OUT)
     inspected(world, "check", SOURCE)
-
-
-if __name__ == "__main__":
-    sys.exit(case.main(__doc__))

@@ -1,18 +1,15 @@
-#!/usr/bin/env python3
 """Holds the names in the documents and the manual pages against those that the compiler and the format have.
 
-    names_test.py LIST_NAMES
-
-LIST_NAMES is the program that prints them, tests/tools/list_names.cpp.
+They come from the program tests/tools/list_names.cpp.
 """
 
 import collections
 import re
 import subprocess
-import sys
 import unittest
 
 from documents import DOCUMENTS, PAGES, PROJECT, chapters, sources, spans, tables, text_of
+from programs import PROGRAMS
 
 LANGUAGE, FORMAT = PROJECT / "docs/language.md", PROJECT / "docs/format.md"
 # Records that have no chapter of their own: entries of lists, and what stands in tables of other chapters.
@@ -46,7 +43,10 @@ def known_fields(names):
 
 class Names(unittest.TestCase):
     maxDiff = None
-    names = {}
+
+    @classmethod
+    def setUpClass(cls):
+        cls.names = read_names(PROGRAMS.list_names)
 
 
 class Language(Names):
@@ -206,8 +206,3 @@ class Everywhere(Names):
             text = re.sub(r"\(name/table\): \w+", "", text_of(path))
             for word in re.findall(r"\b[A-Z]\w+(?:Definition|ResourceAttribute|ClassAttribute)\b", text):
                 self.assertIn(word, stanzas, path)
-
-
-if __name__ == "__main__":
-    Names.names = read_names(sys.argv.pop(1))
-    unittest.main(verbosity=2)

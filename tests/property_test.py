@@ -16,7 +16,6 @@ failure names the seed that shows it:
 generate_sources.py DIRECTORY 1 SEED writes its source again.
 """
 
-import argparse
 import functools
 import operator
 import os
@@ -27,12 +26,17 @@ import subprocess
 import sys
 import tempfile
 
+import pytest
+
 import generate_sources
 import german
 import reverse_cdb
+from compare import none
+from programs import PROGRAMS
 
 GROUPS = 40
-CASES = 20000
+CASES = 20000  # sources that all groups have together
+SANITIZED_CASES = 2000
 MUTATIONS = 2  # of each source
 CATALOGUED = 2000  # sources that have everything between them
 SAMPLE = 100  # one of so many is compiled by the program itself too
@@ -377,7 +381,7 @@ class Catalogue:
         return used
 
 
-def check_catalogue(programs, _):
+def check_catalogue(programs):
     """Whatever the language has comes up in the first sources, where it belongs."""
     listing = subprocess.run([programs.list_names], capture_output=True, text=True, check=True).stdout
     known = Catalogue(listing).all()
@@ -390,7 +394,7 @@ def check_catalogue(programs, _):
     return problems + [f"{' '.join(names)} is refused and not in the language" for names in sorted(refused - known)]
 
 
-def check_determined(_, seeds):
+def check_determined(seeds):
     """A seed gives the same source each time, and another seed another."""
     texts = [generate_sources.source(seed)[0] for seed in seeds]
     again = [generate_sources.source(seed)[0] for seed in seeds]
@@ -398,43 +402,30 @@ def check_determined(_, seeds):
     return problems if len(set(texts)) == len(texts) else [*problems, "two seeds have one source"]
 
 
-def names():
-    """All tests."""
-    return ["catalogue", "determined", *(f"sources-{group:02}" for group in range(GROUPS))]
+# ---- Tests -----------------------------------------------------------------------
 
 
-def run(name, options):
-    """The problems of one test."""
-    each = -(-options.cases // GROUPS)
-    if name == "catalogue":
-        return check_catalogue(options, None)
-    if name == "determined":
-        return check_determined(options, range(each))
-    group = int(name.rpartition("-")[2])
-    return check_group(options, range(options.first + group * each, options.first + (group + 1) * each))
+def seeds_of(group):
+    """The seeds of a group; a sanitizer gets fewer."""
+    cases = PROGRAMS.cases or (SANITIZED_CASES if PROGRAMS.sanitizers else CASES)
+    each = -(-cases // GROUPS)
+    return range(PROGRAMS.first + group * each, PROGRAMS.first + (group + 1) * each)
 
 
-def main():
-    """Run the named tests, or all, and print the count; without programs, print the names."""
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    for given in ("cdgen", "cdef", "compile-many", "list-names", "locales"):
-        parser.add_argument(f"--{given}", type=lambda text: pathlib.Path(text).resolve())
-    parser.add_argument("--cases", type=int, default=CASES, help="how many sources all groups have together")
-    parser.add_argument("--first", type=int, default=0, help="the first seed")
-    parser.add_argument("names", nargs="*")
-    options = parser.parse_args()
-    if options.compile_many is None:
-        print("\n".join(names()))
-        return 0
-    failed = 0
-    for name in options.names or names():
-        problems = run(name, options)
-        failed += bool(problems)
-        if problems:
-            print(f"FAIL {name}", *problems[:10], f"{len(problems)} problems", sep="\n    ")
-    print(f"{len(options.names or names()) - failed} passed, {failed} failed")
-    return 1 if failed else 0
+@pytest.mark.slow(3)
+def test_catalogue():
+    """Whatever the language has comes up in the first sources, where it belongs."""
+    none(check_catalogue(PROGRAMS))
 
 
-if __name__ == "__main__":
-    sys.exit(main())
+def test_determined():
+    """A seed gives the same source each time, and another seed another."""
+    none(check_determined(range(len(seeds_of(0)))))
+
+
+@pytest.mark.slow(5)
+@pytest.mark.parametrize("group", range(GROUPS))
+def test_sources(group):
+    """All properties, for the sources of some seeds and their mutations."""
+    problems = check_group(PROGRAMS, seeds_of(group))
+    none(problems[:10] + [f"{len(problems)} problems"] * bool(problems))

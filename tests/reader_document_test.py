@@ -6,16 +6,19 @@ database has to be what the document says, in both byte orders; and of a file
 that is no database nothing.
 """
 
-import argparse
-import pathlib
 import re
 import subprocess
-import sys
-import tempfile
+
+import pytest
+
+from compare import same
+from programs import EXAMPLES, PROGRAMS, PROJECT
 
 BLOCK = re.compile(r"^```(\w*)\n(.*?)^```$", re.MULTILINE | re.DOTALL)
 PROGRAM_LINES = 30
+LIBRARY = "src/reader/libcdb_view.a"
 WARNINGS = ["-Wall", "-Wextra", "-Werror"]
+EXAMPLE = EXAMPLES / "FileSystem.cdefsrc"
 
 
 def blocks(document, language):
@@ -23,13 +26,15 @@ def blocks(document, language):
     return [text for marked, text in BLOCK.findall(document) if marked == language]
 
 
-def compile_blocks(sources, options, directory):
+def compile_blocks(sources, directory):
     """Compile each source; the first one is linked. The program's path."""
+    sanitizers = PROGRAMS.sanitizers
+    flags = [f"-fsanitize={sanitizers}", "-fno-sanitize-recover=all"] if sanitizers else []
     for index, text in enumerate(sources):
         source = directory / f"block{index}.cpp"
         source.write_text(text)
-        command = [options.cxx, "-std=c++20", *WARNINGS, *options.flags.split(), f"-I{options.include}", str(source)]
-        command += [str(options.library), "-o", str(directory / "program")] if index == 0 else ["-fsyntax-only"]
+        command = [PROGRAMS.cache["CMAKE_CXX_COMPILER"], "-std=c++20", *WARNINGS, *flags, f"-I{PROJECT / 'include'}", source]
+        command += [PROGRAMS.build / LIBRARY, "-o", directory / "program"] if index == 0 else ["-fsyntax-only"]
         subprocess.run(command, check=True)
     return directory / "program"
 
@@ -40,31 +45,17 @@ def run(program, operand):
     return result.returncode, result.stdout
 
 
-def main():
-    """Compare the document with the program that it shows."""
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--document", type=pathlib.Path, required=True)
-    parser.add_argument("--example", type=pathlib.Path, required=True, help="the source whose database is printed")
-    parser.add_argument("--cdgen", type=pathlib.Path, required=True)
-    parser.add_argument("--cxx", required=True)
-    parser.add_argument("--flags", default="", help="more flags for the compiler")
-    parser.add_argument("--include", type=pathlib.Path, required=True)
-    parser.add_argument("--library", type=pathlib.Path, required=True)
-    options = parser.parse_args()
-    document = options.document.read_text()
+@pytest.mark.slow(6)
+def test_reader_document(directory):
+    """The document's program prints what the document says."""
+    document = (PROJECT / "docs/reader.md").read_text()
     sources, expected = blocks(document, "cpp"), blocks(document, "")
     assert len(sources) >= 2 and len(expected) == 1, "blocks are missing in the document"
     assert len(sources[0].splitlines()) <= PROGRAM_LINES, "the program has grown"
-    with tempfile.TemporaryDirectory() as name:
-        directory = pathlib.Path(name)
-        program = compile_blocks(sources, options, directory)
-        for extra in ([], ["-s"]):
-            database = directory / "example.cdef"
-            subprocess.run([options.cdgen, *extra, options.example, database], check=True)
-            assert run(program, database) == (0, expected[0]), run(program, database)
-        assert run(program, options.example) == (1, "")
-        assert run(program, directory / "none") == (1, "")
-
-
-if __name__ == "__main__":
-    sys.exit(main())
+    program = compile_blocks(sources, directory)
+    for extra in ([], ["-s"]):
+        database = directory / "example.cdef"
+        subprocess.run([PROGRAMS.cdgen, *extra, EXAMPLE, database], check=True)
+        same(run(program, database), (0, expected[0]), *extra)
+    same(run(program, EXAMPLE), (1, ""), "of a file that is no database")
+    same(run(program, directory / "none"), (1, ""), "of a file that is missing")

@@ -1,20 +1,20 @@
 """Signals and other programs: what ends cdgen, or cuts its output, leaves no half database.
 
-Every case is a function below, named for what it shows.  strace lets a signal
+Every test is a function below, named for what it shows.  strace lets a signal
 arrive at one system call on the output, so that nothing depends on time.  Where
-processes may not be traced, a case exits with 77 and says why.
+processes may not be traced, a test is skipped and says why.
 """
 
 import os
 import shutil
 import signal
 import subprocess
-import sys
 import time
 
-from cases import BEFORE, HEAD, OUT, SOURCE, TIMEOUT, Cases, Skip, attributes, check, expect
+import pytest
 
-case = Cases()
+from cases import BEFORE, HEAD, OUT, SOURCE, TIMEOUT, attributes, check, expect
+
 ENDING = (signal.SIGHUP, signal.SIGINT, signal.SIGQUIT, signal.SIGTERM)
 TRACE = "trace"
 STAGES = ("ftruncate", "writev", "mmap")  # emptying what was there, filling, mapping
@@ -24,12 +24,12 @@ def struck(world, call, number, file=OUT, **more):
     """The program, started to get a signal at a system call on a file."""
     tracer = shutil.which("strace")
     if tracer is None:
-        raise Skip("no strace(1) here")
+        pytest.skip("no strace(1) here")
     world.write(TRACE, b"")
     options = ["-o", world.path(TRACE), "-P", world.path(file), "-e", f"trace={call}", "-e", f"inject={call}:signal={number}:when=1"]
     probe = subprocess.run([tracer, "-qq", "-o", "/dev/null", "true"], capture_output=True, check=False)
     if probe.returncode != 0:
-        raise Skip("tracing is not allowed here: " + probe.stderr.decode())
+        pytest.skip("tracing is not allowed here: " + probe.stderr.decode())
     command = [tracer, *options, world.program, world.path(SOURCE), world.path(OUT)]
     started = world.options(**more)
     started["env"]["ASAN_OPTIONS"] = "detect_leaks=0"  # which looks for them by tracing, too
@@ -42,8 +42,7 @@ def ended_by(process, number):
     check((process.returncode, *streams) == (-number, b"", b""), "expected", -number, "actual", process.returncode, streams)
 
 
-@case
-def before_the_output_is_opened(world):
+def test_before_the_output_is_opened(world):
     """What was there stays."""
     for number in ENDING:
         world.write(OUT, BEFORE)
@@ -51,8 +50,7 @@ def before_the_output_is_opened(world):
         check(world.read() == BEFORE, "the output was touched")
 
 
-@case
-def while_the_output_is_written(world):
+def test_while_the_output_is_written(world):
     """The output goes, and the program ends as the signal wants it."""
     for number in ENDING:
         for stage in STAGES:
@@ -61,8 +59,7 @@ def while_the_output_is_written(world):
             check(not world.path(OUT).exists(), "an output is left at", stage)
 
 
-@case
-def ignored_ones_stay_ignored(world):
+def test_ignored_ones_stay_ignored(world):
     """As for what goes on in the background when its terminal is closed."""
     good = world.good()
     for number in ENDING:
@@ -86,8 +83,7 @@ def wait_until_stopped(world, process):
     return only_child(process)
 
 
-@case
-def output_cut_by_another_program(world):
+def test_output_cut_by_another_program(world):
     """A message and a status; the file is the other program's."""
     world.write(SOURCE, HEAD + attributes(1000))
     process = struck(world, "mmap", signal.SIGSTOP)
@@ -98,7 +94,3 @@ def output_cut_by_another_program(world):
     expect(subprocess.CompletedProcess([], process.returncode, *streams), 1,
            b"Cannot map CDB file: it was cut while it was written\n")
     check(world.path(OUT).stat().st_size < 8192, "the output was written")
-
-
-if __name__ == "__main__":
-    sys.exit(case.main(__doc__))

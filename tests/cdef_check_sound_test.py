@@ -1,0 +1,192 @@
+"""Compare "cdef check" with cdgen on many sources.
+
+A source has no error exactly when cdgen compiles it, and the first error is
+the one that cdgen prints: the same text and, where cdgen tells one, the same
+line.  The sources are the golden cases; golden cases and examples with a few
+changes; and those of generate_sources.py, as they are and with its mutations.
+
+The made ones come in groups, each of which is a test of its own.  Everything
+follows from a group's number.  Option --keep of pytest is a directory for
+sources that differ.
+"""
+
+import json
+import os
+import pathlib
+import random
+import re
+import subprocess
+import tempfile
+
+import pytest
+
+import generate_sources
+from compare import none
+from programs import EXAMPLES, PROGRAMS, TESTS
+
+BATCH = 100
+GROUPS = 8
+COUNT = 20000  # sources that all groups make together
+SANITIZED_COUNT = 3000
+MUTATIONS = 3  # of each source of generate_sources.py
+WORDS = [
+    "0", "-1", "1,2", "2,1", "4294967296", "99999999999999999999", "010", "0x", "0xAb", "abc", "", '""', '"', '"a" b',
+    "Int32", "UInt64Array", "SD", "SDArray", "SBS", "RH", "None", "Float32", "String", "Binary", "Public", "Public,",
+    "NoSuch", "Counter", "x", "1.5,0.5", "1e39", "a\\377b", "#", "//", "\r", "\t",
+]
+HEADERS = [
+    "ControlDefinition", "ResourceClass", "ClassToManagerMapping", "ResourceVariableClass",
+    "PersistentResourceAttribute", "PersistentClassAttribute", "DynamicResourceAttribute", "DynamicClassAttribute",
+    "ClassAction", "ResourceAction", "PAttrSDDefinition", "DAttrSDDefinition", "DefineSDDefinition",
+    "OnlineSDDefinition", "ActionInSDDefinition", "ActionOutSDDefinition",
+]
+
+
+def stanzas_of(lines):
+    """The lines, cut in front of each header."""
+    groups = [[]]
+    for line in lines:
+        if line[:1] not in ("", " ", "\t", "#", "/"):
+            groups.append([])
+        groups[-1].append(line)
+    return groups
+
+
+def change_lines(rng, lines, pool):
+    """One change of a line or of a stanza."""
+    at = rng.randrange(len(lines)) if lines else 0
+    kind = rng.randrange(12)
+    if kind == 0 and lines:
+        del lines[at]
+    elif kind == 1 and lines:
+        lines.insert(at, lines[at])
+    elif kind == 2:
+        lines.insert(at, rng.choice(pool))
+    elif kind == 3 and lines:
+        other = rng.randrange(len(lines))
+        lines[at], lines[other] = lines[other], lines[at]
+    elif kind == 4 and lines:
+        name = lines[at].split("=")[0]
+        lines[at] = f"{name}={rng.choice(WORDS)}"
+    elif kind == 5 and lines and lines[at]:
+        place = rng.randrange(len(lines[at]))
+        lines[at] = lines[at][:place] + rng.choice("a= \t\"#/,0Z") + lines[at][place + rng.randrange(2):]
+    elif kind == 6 and lines:
+        lines[at] = lines[at].lstrip()
+    elif kind == 7:
+        lines.insert(at, rng.choice(HEADERS))
+    elif kind == 8 and lines:
+        lines[at] += rng.choice([" " * 300, "x" * 250, "#", "\r", '"'])
+    elif kind == 9:
+        groups = stanzas_of(lines)
+        one, two = rng.randrange(len(groups)), rng.randrange(len(groups))
+        groups[one], groups[two] = groups[two], groups[one]
+        lines[:] = sum(groups, [])
+    elif kind == 10:
+        groups = stanzas_of(lines)
+        groups.insert(rng.randrange(len(groups)), rng.choice(groups))
+        lines[:] = sum(groups, [])
+    elif kind == 11:
+        groups = stanzas_of(lines)
+        del groups[rng.randrange(len(groups))]
+        lines[:] = sum(groups, [])
+
+
+def generated(seeds, count, seed):
+    """Changed sources."""
+    rng = random.Random(seed)
+    pool = [line for text in seeds for line in text.split("\n")]
+    for _ in range(count):
+        lines = rng.choice(seeds).split("\n")
+        if len(lines) > 150:
+            start = rng.randrange(len(lines) - 100)
+            lines = lines[:20] + lines[start:start + 80] + lines[-8:]
+        for _ in range(rng.choice((1, 1, 2, 3, 6))):
+            change_lines(rng, lines, pool)
+        yield "\n".join(lines)
+
+
+def mutated(count, seed):
+    """Sources that are right, each with mutations."""
+    for number in range(seed * COUNT, seed * COUNT + -(-count // (1 + MUTATIONS))):
+        text, _ = generate_sources.source(number)
+        yield text
+        for mutation in range(MUTATIONS):
+            yield generate_sources.mutation(number * MUTATIONS + mutation, text)
+
+
+def plain(text):
+    """A message, however many bytes that are no text each replacement stands for."""
+    return re.sub("\ufffd+", "\ufffd", text.replace("\t", " "))
+
+
+def compiled(program, paths, directory):
+    """What cdgen says about each source, by its driver: None when it compiles it."""
+    jobs = "".join(f"{path}\tout.cdef\n" for path in paths)
+    result = subprocess.run(
+        [program], input=os.fsencode(jobs), cwd=directory, stdout=subprocess.PIPE, check=True, timeout=600)
+    answers = [line.split(b"\t", 1) for line in result.stdout.split(b"\n")[:-1]]
+    texts = [None if status == b"0" else text.removesuffix(b"\t").decode("utf-8", "replace") for status, text in answers]
+    if len(texts) != len(paths):
+        raise RuntimeError(f"{program} answers {len(texts)} of {len(paths)}")
+    return texts
+
+
+def same(expected, errors):
+    """Whether the errors begin with what cdgen said."""
+    if expected is None or not errors:
+        return expected is None and not errors
+    message = plain(errors[0]["message"])
+    return plain(expected) in (f"{errors[0]['line']}: {message}", message)
+
+
+def differences(paths, directory):
+    """The differences for some sources."""
+    result = subprocess.run([PROGRAMS.cdef, "check", "--format", "json", *paths], capture_output=True, timeout=600)
+    if result.returncode not in (0, 1) or result.stderr:
+        return [f"status {result.returncode}: {result.stderr!r} for {paths}"]
+    problems = []
+    said = compiled(PROGRAMS.compile_many, paths, directory)
+    for path, checked, expected in zip(paths, json.loads(result.stdout), said):
+        errors = [each for each in checked["findings"] if each["severity"] == "error"]
+        if not same(expected, errors):
+            problems.append(f"{path}: cdgen says {expected!r}, cdef check {errors[:1]}")
+    return problems
+
+
+def count():
+    """How many sources all groups make together; a sanitizer gets fewer."""
+    return PROGRAMS.cases or (SANITIZED_COUNT if PROGRAMS.sanitizers else COUNT)
+
+
+def made(seeds, group):
+    """The sources of a group, half of either kind."""
+    share = count() // GROUPS
+    for text in generated(seeds, share // 2, PROGRAMS.first + group):
+        yield text.encode()
+    yield from mutated(share - share // 2, PROGRAMS.first + group)
+
+
+@pytest.mark.slow(8)
+@pytest.mark.parametrize("group", range(GROUPS))
+def test_same_errors(group, directory):
+    """The golden cases, in the first group, and the sources of a group."""
+    golden = sorted((TESTS / "golden").glob("**/*.cdefsrc"))
+    examples = sorted(EXAMPLES.glob("*.cdefsrc"))
+    seeds = [path.read_bytes().decode("utf-8", "replace") for path in golden + examples]
+    paths = golden if group == 0 else []
+    for number, text in enumerate(made([text for text in seeds if len(text) < 50000], group)):
+        paths.append(directory / f"{number}.cdefsrc")
+        paths[-1].write_bytes(text)
+    problems = []
+    for start in range(0, len(paths), BATCH):
+        problems += differences(paths[start:start + BATCH], directory)
+    keep(problems)
+    none(problems)
+
+
+def keep(problems):
+    """Copies the sources that differ to where they are wanted."""
+    for problem in problems if PROGRAMS.keep else ():
+        source = pathlib.Path(problem.split(":")[0])
+        (PROGRAMS.keep / source.name).write_bytes(source.read_bytes())

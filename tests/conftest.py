@@ -1,0 +1,64 @@
+"""What all tests share: which build is tested, a world of their own for cases, and the order of the slow ones."""
+
+import pathlib
+import tempfile
+
+import pytest
+
+pytest.register_assert_rewrite("cases")
+
+from programs import PROGRAMS, PROJECT  # noqa: E402  (after the registration)
+
+
+def pytest_addoption(parser):
+    """Options of our own."""
+    group = parser.getgroup("cdgen")
+    group.addoption("--build", default=PROJECT / "build/test", help="the build directory whose programs are tested")
+    group.addoption("--cdgen", help="another compiler to test than the build's")
+    group.addoption("--native", choices=("little", "big"), default="little", help="byte order of the machine it is for")
+    group.addoption("--there", type=pathlib.Path, help="a compiler for the other byte order, for cross_endian_test.py")
+    group.addoption("--runner", default="", help="the command that runs it")
+    group.addoption("--cases", type=int, help="how many generated sources; by default 20000, under sanitizers fewer")
+    group.addoption("--keep", type=pathlib.Path, help="where to leave generated sources that fail")
+    group.addoption("--first", type=int, default=0, help="the first seed of generated sources")
+
+
+def pytest_configure(config):
+    """Before any test is collected."""
+    PROGRAMS.use(config.getoption("build"), config.getoption("cdgen"), config.getoption("native"))
+    PROGRAMS.cases, PROGRAMS.first = config.getoption("cases"), config.getoption("first")
+    there = config.getoption("there")
+    PROGRAMS.there, PROGRAMS.runner = there and there.resolve(), config.getoption("runner")
+    PROGRAMS.keep = config.getoption("keep")
+    if not PROGRAMS.cdgen.exists():
+        raise pytest.UsageError(f"there is no {PROGRAMS.cdgen}: build it, or name another directory by --build")
+
+
+def pytest_ignore_collect(collection_path):
+    """What needs another machine's compiler."""
+    return True if collection_path.name == "cross_endian_test.py" and PROGRAMS.there is None else None
+
+
+def pytest_collection_modifyitems(items):
+    """The slow ones first, so that the last ones to end are quick."""
+
+    def seconds(item):
+        mark = item.get_closest_marker("slow")
+        return mark.args[0] if mark else 0
+
+    items.sort(key=seconds, reverse=True)
+
+
+@pytest.fixture
+def directory():
+    """A directory that any user can reach."""
+    with tempfile.TemporaryDirectory(prefix="cdgen-case-") as name:
+        yield pathlib.Path(name)
+
+
+@pytest.fixture
+def world(directory):
+    """A directory with the program and a source; see cases.py."""
+    from cases import World
+
+    return World(PROGRAMS, directory)

@@ -1,0 +1,68 @@
+"""Hold this machine's cdgen and one of the other byte order against each other.
+
+For every source: the same exit status, messages and traces, with and without
+option s; and the file that one machine writes is, byte for byte, the file that
+the other writes with option s, both ways round.  Options --there and --runner
+of pytest name the other machine's compiler and what runs it here.
+
+What the reversal leaves alone (see docs/format.md) stays in the order of the
+machine that compiled.  A case whose image marks such places may differ there
+and in the checksum, and nowhere else; no other source may differ at all.
+"""
+
+import os
+
+import pytest
+
+import golden
+from compare import none
+from programs import EXAMPLES, PROGRAMS, TESTS
+
+CHECKSUM = range(4, 8)
+SOURCES = [path for directory in (TESTS / "golden", TESTS / "twins", EXAMPLES) for path in golden.cases_below(directory)]
+
+
+def load(path):
+    """The case of an expectation, or of a source alone, of which nothing is expected."""
+    return golden.Case(path) if path.exists() else golden.Source(path)
+
+
+def run(case, program, runner, extra):
+    """Status, both streams and the output file of one run."""
+    os.environ["CDGEN_RUNNER"] = runner
+    result, _, after = golden.run(case, program, extra)
+    return (result.returncode, result.stdout, result.stderr), after.get(case.out)
+
+
+def left_alone(case, order):
+    """The bytes of a case's image that depend on the machine."""
+    ours = case.expected_image(order, "little")
+    theirs = case.expected_image(order, "big")
+    if not ours or ours[0] == theirs[0]:
+        return set()
+    return {at for at, (a, b) in enumerate(zip(ours[0], theirs[0])) if a != b} | set(CHECKSUM)
+
+
+def differences(case, here, there):
+    """The differences between a run on each machine that ought to be alike."""
+    outcome, written = run(case, PROGRAMS.cdgen, "", here)
+    other_outcome, other_written = run(case, PROGRAMS.there, PROGRAMS.runner, there)
+    problems = []
+    if outcome != other_outcome:
+        problems.append(f"outcome differs:\n      here  {outcome!r}\n      there {other_outcome!r}")
+    if (written is None) != (other_written is None):
+        problems.append("only one machine wrote a file")
+    elif written is not None and outcome[0] == 0:
+        order = "big" if here else "little"
+        allowed = left_alone(case, order)
+        differing = [at for at, (a, b) in enumerate(zip(written, other_written)) if a != b and at not in allowed]
+        if len(written) != len(other_written) or differing:
+            problems.append(f"files differ, first at {differing[:1]}, sizes {len(written)} and {len(other_written)}")
+    return problems
+
+
+@pytest.mark.parametrize("path", SOURCES, ids=lambda path: path.stem)
+def test_same_on_both(path):
+    """What each machine makes of a source, with option s on either."""
+    case = load(path)
+    none([line for here, there in (([], ["-s"]), (["-s"], [])) for line in differences(case, here, there)])

@@ -1,0 +1,31 @@
+"""What the fuzzers begin with and what they ever found, replayed."""
+
+import subprocess
+
+import pytest
+
+from programs import PROGRAMS, TESTS
+
+FUZZERS = ("source", "image", "cdef")
+FOUND = [what for what in FUZZERS if any((TESTS / "fuzz/found" / what).glob("*"))]
+
+
+def replay(what, directory):
+    """Give a fuzz target all files of a directory."""
+    assert any(directory.iterdir()), f"nothing in {directory}"
+    command = [PROGRAMS.build / "tests/fuzz" / f"{what}_fuzz", directory]
+    done = subprocess.run(command, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, timeout=1800, check=False)
+    assert done.returncode == 0, done.stdout.decode(errors="replace")[-5000:]
+
+
+@pytest.mark.slow(5)
+@pytest.mark.parametrize("what", FUZZERS)
+def test_seeds(what):
+    """Golden sources, their databases, pairs of these, and generated ones."""
+    replay(what, PROGRAMS.build / "tests/fuzz/seeds" / what)
+
+
+@pytest.mark.parametrize("what", FOUND)
+def test_found(what):
+    """Inputs that once showed a defect."""
+    replay(what, TESTS / "fuzz/found" / what)

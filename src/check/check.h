@@ -3,7 +3,7 @@
 #ifndef CDGEN_CDEF_CHECK_H
 #define CDGEN_CDEF_CHECK_H
 
-#include "compiler/cdgen_read.h"
+#include "compiler/stepwise.h"
 #include "language/suggestions.h"
 
 #include <array>

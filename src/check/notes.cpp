@@ -58,7 +58,7 @@ struct noting {
         return check.stanzas[index_of(kind)];
     }
     name_list missing() const {
-        return missing_names(table(), check.cx.stanzas[index_of(kind)].req_mask);
+        return missing_names(table(), check.compiler.required_seen(kind));
     }
     std::string marked() const {
         return check.raw.substr(found.at.column - 1, found.at.length);
@@ -99,7 +99,7 @@ void too_early(noting &n) {
 }
 
 void repeated(noting &n) {
-    auto at = static_cast<size_t>(n.check.cx.latest.attr - n.table().sc_attrs.data());
+    auto at = static_cast<size_t>(n.check.latest.attr - n.table().sc_attrs.data());
     n.first_given(n.stanza().given[at]);
 }
 
@@ -120,7 +120,7 @@ void second_map(noting &n) {
 }
 
 void unknown_property(noting &n) {
-    n.add(n.found.at, suggestion(n.marked(), property_names(n.check.cx.latest.attr->ta_type)));
+    n.add(n.found.at, suggestion(n.marked(), property_names(n.check.latest.attr->ta_type)));
 }
 
 void unknown_type(noting &n) {
@@ -139,7 +139,7 @@ void overflowed(noting &n) {
 
 void bad_value(noting &n) {
     session &check = n.check;
-    vx_data_type_t type = data_type(check.cx);
+    vx_data_type_t type = check.compiler.data_type();
     bool numeric = scalar_vx(type) >= VX_INT32 && scalar_vx(type) <= VX_FLOAT64;
     if (numeric && check.overflow_line != 0)
         overflowed(n);
@@ -152,7 +152,7 @@ void bad_value(noting &n) {
 
 void wrong_index(noting &n) {
     session &check = n.check;
-    int expected = check.cx.expected_sdeli;
+    int expected = check.compiler.expected_index();
     bool as_expected = std::strtol(n.marked().c_str(), nullptr, 10) == expected;
     if (check.overflow_line != 0 && as_expected)
         overflowed(n);

@@ -110,7 +110,7 @@ void session::watch_unsigned(std::string_view text, size_t offset, vx_data_type_
 
 /* A value of the attribute's own type, or one part of it. */
 void session::watch_typed(std::string_view text, size_t offset) {
-    vx_data_type_t type = scalar_vx(data_type(cx));
+    vx_data_type_t type = scalar_vx(compiler.data_type());
     if (type == VX_UINT32 || type == VX_UINT64)
         return watch_unsigned(text, offset, type);
     if (type != VX_INT32)
@@ -126,7 +126,7 @@ void session::watch_typed(std::string_view text, size_t offset) {
 void session::watch_index(std::string_view text) {
     constexpr int TOO_HIGH = 1 << 16;
     watch_unsigned(text, 0, VX_UINT32);
-    if (cx.curr_sdeli == TOO_HIGH && cx.max_sd_idx != nullptr)
+    if (compiler.element_index() == TOO_HIGH && compiler.run_has_highest_index())
         warn(NARROWED, value_part(0, text.size()), "does not fit 16 bits, which the attribute's highest index has");
 }
 
@@ -156,7 +156,7 @@ void session::watch_id(std::string_view text) {
 
 void session::watch_numbers() {
     std::string_view text = value_text();
-    switch (cx.latest.attr->ta_type) {
+    switch (latest.attr->ta_type) {
     case AT_UINT16:
     case AT_SD_DESCRIPTION:
     case AT_SD_DISPLAY:
@@ -189,7 +189,7 @@ void session::watch_numbers() {
 }
 
 void session::watch_valid(std::string_view text) {
-    if (!is_numeric(data_type(cx)))
+    if (!is_numeric(compiler.data_type()))
         return;
     pair_of_texts both(text);
     watch_typed(both.low, 0);
@@ -203,8 +203,8 @@ void session::watch_valid(std::string_view text) {
 void session::watch_bounds() {
     std::string_view text = value_text();
     pair_of_texts both(text);
-    bool variety = cx.latest.attr->ta_type == AT_VARIETY;
-    vx_data_type_t type = variety ? VX_UINT32 : scalar_vx(data_type(cx));
+    bool variety = latest.attr->ta_type == AT_VARIETY;
+    vx_data_type_t type = variety ? VX_UINT32 : scalar_vx(compiler.data_type());
     bool above = false;
     if (type == VX_FLOAT32 || type == VX_FLOAT64) {
         above =
@@ -217,7 +217,7 @@ void session::watch_bounds() {
         above = number(both.low, base).value > number(both.high, base).value;
     }
     if (above)
-        warn(LOW_ABOVE_HIGH, value_part(0, cx.latest.length), "the lower bound is above the upper one");
+        warn(LOW_ABOVE_HIGH, value_part(0, latest.length), "the lower bound is above the upper one");
 }
 
 } // namespace cdef::check

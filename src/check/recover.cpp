@@ -11,33 +11,8 @@ namespace {
 constexpr std::string_view BYTE_ORDER_MARK = "\xEF\xBB\xBF";
 constexpr int HEADER_TRIES = SC_COUNT; /* each one closes a record */
 
-bool is_open(cdgen &cx, int kind) {
-    vx_uint32_t identifier = 0;
-    memcpy(&identifier, sc_tables[index_of(kind)].sc_cb(cx), sizeof identifier);
-    return identifier != 0;
-}
-
-void close_record(cdgen &cx, int kind) {
-    constexpr vx_uint32_t none = 0;
-    memcpy(sc_tables[index_of(kind)].sc_cb(cx), &none, sizeof none);
-}
-
 bool is_header(std::string_view name) {
     return set_table_id(std::string(name).c_str()) >= 0;
-}
-
-void complete_element(cdgen &cx) {
-    cx.sd_name_found = cx.sd_desc_found = cx.sd_disp_found = cx.sd_dt_found = 1;
-}
-
-/* A run that is given up. */
-void close_run(cdgen &cx) {
-    cx.cb_sd_def.sd_cb_ID = 0;
-    cx.attr_dflt_val = nullptr;
-    cx.curr_sd_tbl = nullptr;
-    cx.max_sd_idx = nullptr;
-    cx.curr_sdeli = -1;
-    cx.expected_sdeli = 0;
 }
 
 constexpr vx_uint32_t bit_of(int kind) {
@@ -85,7 +60,7 @@ bool session::may_follow(const fatal_exit &failure) {
 
 /* Whether the stanza that an error misses has been told of: it is broken, or its header is lost. */
 bool session::told_otherwise(const fatal_exit &failure) const {
-    bool map_broken = cx.stanzas[SC_CLASS_TO_MANAGER_MAPPING].broken;
+    bool map_broken = stanzas[SC_CLASS_TO_MANAGER_MAPPING].broken;
     if (failure.id == MSG_NO_CLASSES || failure.id == MSG_NO_STRING_TABLE)
         return may_be_lost(SC_CONTROL_DEFINITION);
     if (failure.id == MSG_NO_MAPS)
@@ -110,15 +85,12 @@ attr_text session::again(std::string_view text) {
 
 /* Stanzas before the class, or without any, are checked in a class of their own. */
 void session::forge_class() {
-    if (cx.cb_rsrc_class.rc_cb_ID != 0)
-        return;
-    init_class_tbl(cx);
-    class_forged = true;
+    class_forged = compiler.forge_class() || class_forged;
 }
 
 /* What is not completed has no use for its ranges. */
 void session::drop_record(int dropped) {
-    close_record(cx, dropped);
+    compiler.drop_record(dropped);
     int begun = stanzas[index_of(dropped)].header.line;
     std::erase_if(seen.ranges,
                   [&](const pending_range &range) { return range.kind == dropped && range.at.line >= begun; });
@@ -126,13 +98,13 @@ void session::drop_record(int dropped) {
 
 /* What has been reported is not completed: its record is dropped before the compiler comes to it. */
 void session::settle_broken(int next_kind) {
-    if (cx.cb_sd_def.sd_cb_ID != 0 && cx.stanzas[index_of(sd_kind)].broken)
-        complete_element(cx);
+    if (compiler.run_is_open() && stanzas[index_of(sd_kind)].broken)
+        compiler.complete_element();
     if (next_kind >= 0 && is_sd_kind(next_kind))
         return;
     for (int each : {SC_PERSISTENT_RESOURCE_ATTRIBUTE, SC_PERSISTENT_CLASS_ATTRIBUTE, SC_DYNAMIC_RESOURCE_ATTRIBUTE,
                      SC_DYNAMIC_CLASS_ATTRIBUTE, SC_RESOURCE_ACTION, SC_CLASS_ACTION})
-        if (is_open(cx, each) && cx.stanzas[index_of(each)].broken)
+        if (compiler.is_open(each) && stanzas[index_of(each)].broken)
             drop_record(each);
 }
 
@@ -141,38 +113,28 @@ void session::abandon(int failed_kind, const fatal_exit &failure) {
     if (!is_sd_kind(failed_kind))
         drop_record(failed_kind);
     else if (failure.id == MSG_INCOMPLETE_STANZA)
-        complete_element(cx);
+        compiler.complete_element();
     else
-        close_run(cx);
+        compiler.give_up_run();
 }
 
 /* The elements are checked all the same; they belong to nothing. */
 void session::finish_run_by_hand(int new_kind) {
     forge_class();
-    cx.attr_dflt_val = nullptr;
-    cx.max_sd_idx = nullptr;
-    cx.curr_sd_tbl = &nobody;
-    nobody.offset[0] = mk_sd_sec(cx);
-    cx.scp = cx.curr_sd_scp = &sc_tables[index_of(new_kind)];
-    cx.state = &cx.stanzas[index_of(new_kind)];
-    cx.table_id = new_kind;
-    cx.scp->sc_init_tbl(cx);
-    cx.state->req_mask = cx.state->opt_mask = 0;
-    cx.state->dflt = {};
+    compiler.begin_run_of_nobody(new_kind);
 }
 
 /* Whether the run's indexes cannot be told any more: an element that has been reported gave none. */
 bool session::lost_index(int new_kind) const {
-    if (new_kind != sd_kind || cx.cb_sd_def.sd_cb_ID == 0)
+    if (new_kind != sd_kind || !compiler.run_is_open())
         return false;
-    const stanza_state &element = cx.stanzas[index_of(sd_kind)];
-    return kind < 0 || (element.broken && (element.req_mask & ELEMENT_INDEX) == 0);
+    return kind < 0 || (stanzas[index_of(sd_kind)].broken && (compiler.required_seen(sd_kind) & ELEMENT_INDEX) == 0);
 }
 
 void session::open_stanza(int new_kind, bool broken) {
     bool same_run = kind == new_kind && is_sd_kind(new_kind);
     if (!same_run) { /* after a mistake it may be the rest of a run */
-        index_lost = kind < 0 || cx.stanzas[index_of(kind)].broken;
+        index_lost = kind < 0 || stanzas[index_of(kind)].broken;
         other_index = -1;
         odd_elements.clear();
         types_told = false;
@@ -184,7 +146,7 @@ void session::open_stanza(int new_kind, bool broken) {
     if (is_sd_kind(kind))
         sd_kind = kind;
     skipping = false;
-    cx.stanzas[index_of(kind)].broken = broken;
+    stanzas[index_of(kind)].broken = broken;
     stanza_note &stanza = stanzas[index_of(kind)];
     stanza.given.fill(0);
     stanza.refused = {};
@@ -193,20 +155,20 @@ void session::open_stanza(int new_kind, bool broken) {
     stanza.header = all_of_line();
     stanza.source = raw;
     if (kind == SC_CLASS_TO_MANAGER_MAPPING)
-        map_line = cx.linenum;
+        map_line = compiler.line_number();
 }
 
 /* Whether the header is to be tried again. */
 bool session::recover_header(const fatal_exit &failure, int new_kind) {
-    if (cx.completing >= 0) {
-        int failed = is_sd_kind(cx.completing) ? sd_kind : cx.completing;
-        if (!cx.stanzas[index_of(failed)].broken && !told_otherwise(failure) && may_follow(failure))
+    if (failure.completing >= 0) {
+        int failed = is_sd_kind(failure.completing) ? sd_kind : failure.completing;
+        if (!stanzas[index_of(failed)].broken && !told_otherwise(failure) && may_follow(failure))
             add_notes(error(failure, here(mark_kind::none)), failure, failed);
         splits_stanza = splits_stanza || (failed == kind && out.errors > header_errors);
         abandon(failed, failure);
         return true;
     }
-    if (cx.cb_rsrc_class.rc_cb_ID == 0 && wants_class(failure.id)) {
+    if (!compiler.class_is_open() && wants_class(failure.id)) {
         if (!may_be_lost(SC_CONTROL_DEFINITION))
             add_notes(error(failure, all_of_line()), failure, new_kind);
         header_told = true;
@@ -214,7 +176,7 @@ bool session::recover_header(const fatal_exit &failure, int new_kind) {
         return true;
     }
     bool no_attribute = failure.id == MSG_NO_SD_ATTRIBUTE;
-    bool told = out.errors > header_errors || kind < 0 || cx.stanzas[index_of(kind)].broken;
+    bool told = out.errors > header_errors || kind < 0 || stanzas[index_of(kind)].broken;
     bool consequence = no_attribute && told && out.errors > 0;
     if (!consequence && may_follow(failure))
         add_notes(error(failure, all_of_line()), failure, new_kind);
@@ -233,10 +195,11 @@ bool session::recover_header(const fatal_exit &failure, int new_kind) {
 
 /* Behind a second map's header: what the first lacks may be here. One of which there is a header only goes on. */
 void session::give_up_map() {
-    stanza_state &map = cx.stanzas[SC_CLASS_TO_MANAGER_MAPPING];
-    if (kind == SC_CLASS_TO_MANAGER_MAPPING && !skipping && map.req_mask == 0)
+    stanza_note &map = stanzas[SC_CLASS_TO_MANAGER_MAPPING];
+    vx_uint32_t seen_of_map = compiler.required_seen(SC_CLASS_TO_MANAGER_MAPPING);
+    if (kind == SC_CLASS_TO_MANAGER_MAPPING && !skipping && seen_of_map == 0)
         return;
-    map.broken = map.broken || map.req_mask != sc_tables[SC_CLASS_TO_MANAGER_MAPPING].req_mask_cmplt;
+    map.broken = map.broken || seen_of_map != sc_tables[SC_CLASS_TO_MANAGER_MAPPING].req_mask_cmplt;
     skip_stanza();
 }
 
@@ -280,7 +243,7 @@ bool session::take_stripped(finding &found, std::string_view name) {
 /* A header that names no kind: of an attribute line without its blank, a near miss, or lost. */
 void session::unknown_header(const attr_text &text, const fatal_exit &failure) {
     std::string_view name(text.name, static_cast<size_t>(text.end - text.name));
-    if (rest_of_line && error_line + 1 == cx.linenum)
+    if (rest_of_line && error_line + 1 == compiler.line_number())
         return; /* all of the line has been told of */
     finding &found = error(failure, all_of_line());
     if (take_stripped(found, name))
@@ -302,8 +265,8 @@ void session::unknown_header(const attr_text &text, const fatal_exit &failure) {
     if (!meant.empty())
         return take_header(again(meant), true);
     watch_stanza_end(-1);
-    if (kind >= 0 && cx.stanzas[index_of(kind)].req_mask != sc_tables[index_of(kind)].req_mask_cmplt)
-        cx.stanzas[index_of(kind)].broken = true; /* the rest of it may be what is skipped */
+    if (kind >= 0 && compiler.required_seen(kind) != sc_tables[index_of(kind)].req_mask_cmplt)
+        stanzas[index_of(kind)].broken = true; /* the rest of it may be what is skipped */
     lose_header(EVERY_KIND);
     skip_stanza();
 }
@@ -323,12 +286,12 @@ void session::skip_stanza() {
 /* The line again, of which an error has been told. */
 void session::take_quietly(std::string_view text) {
     try {
-        cx.latest = {};
-        take_line(cx, again(text));
+        latest = {};
+        compiler.take_line(again(text));
         note_given();
     } catch (const fatal_exit &) {
-        cx.state->broken = true;
-        note_refused(cx.latest.attr == nullptr ? std::nullopt : std::optional(cx.latest.attr->ta_type));
+        stanzas[index_of(kind)].broken = true;
+        note_refused(latest.attr == nullptr ? std::nullopt : std::optional(latest.attr->ta_type));
     }
 }
 
@@ -339,23 +302,20 @@ void session::take_header(const attr_text &text, bool guessed) {
         watch_header(new_kind);
         settle_broken(new_kind);
     }
-    bool resource_open = cx.cb_rsrc_dattr.ra_cb_ID != 0;
-    bool class_open = cx.cb_rsrc_dattrC.ra_cb_ID != 0;
+    bool resource_open = compiler.is_open(SC_DYNAMIC_RESOURCE_ATTRIBUTE);
+    bool class_open = compiler.is_open(SC_DYNAMIC_CLASS_ATTRIBUTE);
     bool no_index = lost_index(new_kind);
     header_errors = out.errors;
     header_told = splits_stanza = false;
     for (int tries = 0; tries < HEADER_TRIES; ++tries) {
-        auto before = std::tuple(cx.scp, cx.prev_scp, cx.curr_sd_scp, cx.state, cx.table_id);
-        cx.completing = -1;
         try {
-            take_line(cx, text);
+            compiler.take_line(text);
             ranges_settled(resource_open, class_open, new_kind);
             open_stanza(new_kind, guessed || header_told);
             stanzas[index_of(new_kind)].misplaced = splits_stanza;
             index_lost = index_lost || no_index;
             return;
         } catch (const fatal_exit &failure) {
-            std::tie(cx.scp, cx.prev_scp, cx.curr_sd_scp, cx.state, cx.table_id) = before;
             if (new_kind < 0)
                 return unknown_header(text, failure);
             if (!recover_header(failure, new_kind))
@@ -373,9 +333,10 @@ std::string_view session::name_given() const {
 /* The attribute type of a line that could not be read; nothing if its name is like none of the kind's. */
 std::optional<int> session::type_meant() const {
     std::string_view name = name_given();
-    const table_attrs *attr = find_attr(*cx.scp, name);
-    if (std::string_view meant = near_miss(name, attribute_names(*cx.scp)); attr == nullptr && !meant.empty())
-        attr = find_attr(*cx.scp, meant);
+    const table_attrs *attr = find_attr(sc_tables[index_of(kind)], name);
+    if (std::string_view meant = near_miss(name, attribute_names(sc_tables[index_of(kind)]));
+        attr == nullptr && !meant.empty())
+        attr = find_attr(sc_tables[index_of(kind)], meant);
     return attr == nullptr ? std::nullopt : std::optional(attr->ta_type);
 }
 
@@ -396,16 +357,18 @@ bool session::misplaced(const fatal_exit &failure) {
     bool &before = stanzas[index_of(kind)].misplaced;
     if (before)
         return unknown || repeated || failure.id == MSG_INVALID_VALUE || failure.id == MSG_NO_VALID_VALUE;
-    bool named = repeated && (cx.latest.attr == cx.scp->sc_attrs.data() || is_name(name_given()));
+    bool named = repeated && (latest.attr == sc_tables[index_of(kind)].sc_attrs.data() || is_name(name_given()));
     vx_uint32_t kinds = unknown || named ? kinds_with(name_given()) : 0;
     before = kinds != 0;
     if (!before)
         return false;
     lose_header(kinds);
     index_lost = index_lost || is_sd_kind(kind); /* this may be another run by now */
-    if (unknown && cx.prev_scp != nullptr) {     /* what is missed there is perhaps here */
-        stanza_state &previous = cx.stanzas[static_cast<size_t>(cx.prev_scp - sc_tables.data())];
-        previous.broken = previous.broken || previous.req_mask != cx.prev_scp->req_mask_cmplt;
+    if (int before_kind = compiler.previous_kind();
+        unknown && before_kind >= 0) { /* what is missed there is perhaps here */
+        stanza_note &previous = stanzas[index_of(before_kind)];
+        previous.broken =
+            previous.broken || compiler.required_seen(before_kind) != sc_tables[index_of(before_kind)].req_mask_cmplt;
     }
     return false;
 }
@@ -429,12 +392,13 @@ void session::lose_first_header(const attr_text &text, const fatal_exit &failure
 /* Whether an attribute's error is a consequence of one that has been told. */
 bool session::attribute_follows(const fatal_exit &failure) {
     if (failure.id == MSG_INDEX_NOT_CONSECUTIVE)
-        return index_lost || (other_index >= 0 && cx.curr_sdeli == other_index);
+        return index_lost || (other_index >= 0 && compiler.element_index() == other_index);
     if (failure.id == MSG_NO_STRING_TABLE)
         return told_otherwise(failure);
     const stanza_note &stanza = stanzas[index_of(kind)];
-    bool typed = cx.latest.attr != nullptr && is_typed(cx.latest.attr->ta_type);
-    bool untyped = cx.state->broken && cx.scp->dt_offset >= 0 && data_type(cx) == VX_UNKNOWN;
+    bool typed = latest.attr != nullptr && is_typed(latest.attr->ta_type);
+    bool untyped = stanzas[index_of(kind)].broken && sc_tables[index_of(kind)].dt_offset >= 0 &&
+                   compiler.data_type() == VX_UNKNOWN;
     if (typed && untyped && failure.id == MSG_INVALID_VALUE)
         return true;
     bool value_refused = stanza.refused.has_any({AT_VALID_VALUE, AT_SD_VALID_VALUE}) || stanza.refused.unknown_name;
@@ -445,9 +409,9 @@ bool session::attribute_follows(const fatal_exit &failure) {
 
 /* Behind a wrong index: either the counting goes on from it, or it is passed over. */
 void session::recover_index(bool follows) {
-    other_index = follows ? -1 : cx.expected_sdeli + 1;
-    bool read = cx.curr_sdeli + 1 != cx.expected_sdeli;
-    cx.expected_sdeli = read ? cx.curr_sdeli + 1 : cx.expected_sdeli + 1;
+    other_index = follows ? -1 : compiler.expected_index() + 1;
+    bool read = compiler.element_index() + 1 != compiler.expected_index();
+    compiler.expect_index((read ? compiler.element_index() : compiler.expected_index()) + 1);
     index_lost = false;
 }
 
@@ -467,7 +431,7 @@ void session::recover_value(const fatal_exit &failure, bool follows) {
     }
     if (failure.id == MSG_NO_STRING_TABLE)
         forge_class();
-    if (is_sd_kind(kind) && failure.id == MSG_INVALID_VALUE && data_type(cx) == VX_UNKNOWN)
+    if (is_sd_kind(kind) && failure.id == MSG_INVALID_VALUE && compiler.data_type() == VX_UNKNOWN)
         tell_type();
 }
 
@@ -484,12 +448,12 @@ void session::recover_attribute(const fatal_exit &failure) {
         tell_instead(NARROWED, overflow_line);
     overflow_told = false;
     recover_value(failure, follows);
-    cx.state->broken = true;
+    stanzas[index_of(kind)].broken = true;
     if (failure.id == MSG_OPTIONAL_TOO_EARLY)
         take_quietly(std::string_view(raw).substr(0, all_of_line().column - 1 + all_of_line().length));
     else
-        note_refused(cx.latest.attr == nullptr ? type_meant() : std::optional(cx.latest.attr->ta_type));
-    cx.conv_errno = 0; /* its mark would be a second report of the same number */
+        note_refused(latest.attr == nullptr ? type_meant() : std::optional(latest.attr->ta_type));
+    compiler.forget_overflow(); /* its mark would be a second report of the same number */
 }
 
 const mention *session::map_value(std::string_view attribute) const {
@@ -500,8 +464,8 @@ const mention *session::map_value(std::string_view attribute) const {
 
 /* Whether the step of the end is to be tried again, without the record that it failed for. */
 bool session::recover_end(const fatal_exit &failure) {
-    int failed = cx.completing < 0 ? -1 : is_sd_kind(cx.completing) ? sd_kind : cx.completing;
-    bool told = failed >= 0 && cx.stanzas[index_of(failed)].broken;
+    int failed = failure.completing < 0 ? -1 : is_sd_kind(failure.completing) ? sd_kind : failure.completing;
+    bool told = failed >= 0 && stanzas[index_of(failed)].broken;
     if (!told && !told_otherwise(failure) && may_follow(failure)) {
         add_notes(error(failure, here(mark_kind::none)), failure, failed);
         if (failure.id == MSG_KEYS_REVERSED && map_value("LastKey") == nullptr)

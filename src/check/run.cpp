@@ -26,10 +26,14 @@ std::string text_of(const fatal_exit &failure) {
 } // namespace
 
 session::session(const std::string &path, const warning_set &wanted_warnings, result &into)
-    : wanted(wanted_warnings), out(into) {
-    cx.checking = true;
-    cx.cdefsrc = path.c_str();
-    cx.cdefname = CLASS_NAME;
+    : wanted(wanted_warnings), out(into), compiler(path.c_str(), CLASS_NAME, *this) {}
+
+void session::attribute_read(const attr_place &read) {
+    latest = read;
+}
+
+bool session::excuses_missing(int of_kind) const {
+    return stanzas[index_of(of_kind)].broken;
 }
 
 /* ---- Findings ------------------------------------------------------------------------------------------------- */
@@ -46,7 +50,7 @@ finding &session::error(const fatal_exit &failure, const place &at) {
                             .source = raw,
                             .notes = {}});
     ++out.errors;
-    error_line = cx.linenum;
+    error_line = compiler.line_number();
     return out.findings.back();
 }
 
@@ -73,11 +77,11 @@ bool session::warn_at(warning_id id, const place &at, const std::string &source,
 
 place session::all_of_line() const {
     size_t begin = static_cast<size_t>(line.name - line.line);
-    return {cx.linenum, begin + 1, static_cast<size_t>(line.end - line.name)};
+    return {compiler.line_number(), begin + 1, static_cast<size_t>(line.end - line.name)};
 }
 
 place session::value_part(size_t offset, size_t length) const {
-    return {cx.linenum, static_cast<size_t>(cx.latest.value - line.line) + offset + 1, length};
+    return {compiler.line_number(), static_cast<size_t>(latest.value - line.line) + offset + 1, length};
 }
 
 place session::here(mark_kind what, const fatal_exit *failure) const {
@@ -85,16 +89,17 @@ place session::here(mark_kind what, const fatal_exit *failure) const {
     size_t equals = raw.find('=', all.column - 1);
     bool split = equals != std::string::npos && equals < all.column - 1 + all.length;
     if (what == mark_kind::none || line.end == nullptr)
-        return {cx.linenum, 0, 0};
+        return {compiler.line_number(), 0, 0};
     if (what == mark_kind::text || !split)
         return all;
     if (what == mark_kind::name)
-        return {cx.linenum, all.column, equals - (all.column - 1)};
+        return {compiler.line_number(), all.column, equals - (all.column - 1)};
     if (what == mark_kind::item && failure != nullptr && failure->detail1 >= line.line && failure->detail1 < line.end)
-        return {cx.linenum, static_cast<size_t>(failure->detail1 - line.line) + 1, strlen(failure->detail1)};
-    if (cx.latest.attr != nullptr && cx.latest.length > 0)
-        return value_part(0, cx.latest.length);
-    return {cx.linenum, equals + 2, all.column - 1 + all.length - (equals + 1)};
+        return {compiler.line_number(), static_cast<size_t>(failure->detail1 - line.line) + 1,
+                strlen(failure->detail1)};
+    if (latest.attr != nullptr && latest.length > 0)
+        return value_part(0, latest.length);
+    return {compiler.line_number(), equals + 2, all.column - 1 + all.length - (equals + 1)};
 }
 
 /* ---- Attribute lines --------------------------------------------------------------------------------------------- */
@@ -102,31 +107,31 @@ place session::here(mark_kind what, const fatal_exit *failure) const {
 void session::take_attribute(const attr_text &text) {
     if (skipping && set_table_id(text.name) < 0)
         return;
-    cx.latest = {};
-    int conversions = cx.conv_errno;
+    latest = {};
+    int conversions = compiler.conversion_errno();
     try {
-        take_line(cx, text);
+        compiler.take_line(text);
     } catch (const fatal_exit &failure) {
         return recover_attribute(failure);
     }
-    if (cx.conv_errno != conversions)
-        overflow_line = cx.linenum;
-    if (cx.latest.attr == nullptr)
+    if (compiler.conversion_errno() != conversions)
+        overflow_line = compiler.line_number();
+    if (latest.attr == nullptr)
         return;
     note_given();
     watch_attribute();
 }
 
 void session::note_given() {
-    if (cx.latest.attr == nullptr)
+    if (latest.attr == nullptr)
         return;
-    auto at = static_cast<size_t>(cx.latest.attr - cx.scp->sc_attrs.data());
+    auto at = static_cast<size_t>(latest.attr - sc_tables[index_of(kind)].sc_attrs.data());
     int &given = stanzas[index_of(kind)].given[at];
     if (given == 0)
-        given = cx.linenum;
+        given = compiler.line_number();
     if (kind == SC_CLASS_TO_MANAGER_MAPPING)
-        map_values.push_back({value_part(0, cx.latest.length), cx.latest.attr->ta_name, raw});
-    if (cx.latest.attr->ta_type == AT_SD_INDEX)
+        map_values.push_back({value_part(0, latest.length), latest.attr->ta_name, raw});
+    if (latest.attr->ta_type == AT_SD_INDEX)
         index_lost = false;
 }
 
@@ -151,13 +156,12 @@ void session::close_all() {
     line = {};
     watch_stanza_end(-1);
     settle_broken(-1);
-    for (closing_step step : closing_steps) {
-        bool resource_open = cx.cb_rsrc_dattr.ra_cb_ID != 0;
-        bool class_open = cx.cb_rsrc_dattrC.ra_cb_ID != 0;
+    for (size_t step = 0; step < stepwise_compiler::closing_steps(); ++step) {
+        bool resource_open = compiler.is_open(SC_DYNAMIC_RESOURCE_ATTRIBUTE);
+        bool class_open = compiler.is_open(SC_DYNAMIC_CLASS_ATTRIBUTE);
         for (int tries = 0; tries < 2; ++tries) {
-            cx.completing = -1;
             try {
-                step(cx);
+                compiler.take_closing_step(step);
                 break;
             } catch (const fatal_exit &failure) {
                 if (!recover_end(failure))
@@ -167,7 +171,7 @@ void session::close_all() {
         ranges_settled(resource_open, class_open, -1);
     }
     try {
-        fit_image(cx);
+        compiler.size_image();
     } catch (const fatal_exit &failure) {
         if (may_follow(failure))
             error(failure, here(mark_kind::none));
@@ -177,12 +181,12 @@ void session::close_all() {
 
 void session::run() {
     try {
-        if (std::string_view(cx.cdefsrc) == "-") /* the descriptor itself: it may be no file, or half read */
-            take_source(cx, cx.cdefsrc, fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
+        if (out.file == "-") /* the descriptor itself: it may be no file, or half read */
+            compiler.open(fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
         else
-            open_source(cx, cx.cdefsrc);
+            compiler.open();
         for (;;) {
-            source_line source = next_line(cx);
+            source_line source = compiler.next_line();
             if (source.begin == nullptr)
                 break;
             take(source);
@@ -190,7 +194,7 @@ void session::run() {
     } catch (const fatal_exit &failure) {
         throw trouble(text_of(failure));
     }
-    cx.cdb_fp.close();
+    compiler.close();
     close_all();
 }
 

@@ -38,6 +38,7 @@ struct stanza_note {
     std::array<int, ATTRS_MAX> given = {}; /* line of each attribute, by its position in the kind; 0: none */
     refused_attributes refused;
     mention data_type;      /* the value of its DataType */
+    bool broken = false;    /* has been reported: nothing is missed in it any more */
     bool misplaced = false; /* lines of another stanza seem to be in it */
     std::string source;     /* the header's line */
 };
@@ -118,10 +119,13 @@ struct watch {
 };
 
 /* A member of the compilation's context, opened, and the text of the current line. */
-struct session {
+struct session final : line_observer {
     session(const std::string &path, const warning_set &wanted_warnings, result &into);
 
     void run();
+
+    void attribute_read(const attr_place &read) override;
+    bool excuses_missing(int of_kind) const override;
 
     /* The line, and its findings (run.cpp, recover.cpp). */
     void take(const source_line &line);
@@ -210,7 +214,8 @@ struct session {
 
     const warning_set &wanted;
     result &out;
-    cdgen cx;
+    stepwise_compiler compiler;
+    attr_place latest; /* of the latest attribute line */
 
     std::string raw;                      /* the line as it was */
     attr_text line = {};                  /* in the reader's buffer, or in copy */
@@ -236,7 +241,6 @@ struct session {
     bool rest_of_line = false;            /* the current line goes on with the one before */
     int map_line = 0;
     std::vector<mention> map_values; /* by the names of their attributes */
-    cdb_ref_t nobody = {};           /* what refers to the elements of a run that belongs to nothing */
     std::array<stanza_note, SC_COUNT> stanzas;
     watch seen;
 };
@@ -247,14 +251,6 @@ constexpr size_t index_of(int kind) {
 
 inline bool is_sd_kind(int kind) {
     return sc_tables[index_of(kind)].sc_sd_owner != nullptr;
-}
-
-/* Of the current stanza; unknown if its kind has none. */
-inline vx_data_type_t data_type(cdgen &cx) {
-    vx_data_type_t type = VX_UNKNOWN;
-    if (cx.scp->dt_offset >= 0)
-        memcpy(&type, static_cast<char *>(cx.scp->sc_cb(cx)) + cx.scp->dt_offset, sizeof type);
-    return type;
 }
 
 inline bool is_numeric(vx_data_type_t type) {

@@ -26,31 +26,30 @@ bool is_action_run(int kind) {
 } // namespace
 
 std::string_view session::value_text() const {
-    return std::string_view(raw).substr(value_part(0, 0).column - 1, cx.latest.length);
+    return std::string_view(raw).substr(value_part(0, 0).column - 1, latest.length);
 }
 
 /* ---- Lines ---------------------------------------------------------------------------------------------------- */
 
 void session::watch_line(const source_line &source) {
-    bool whole_piece = source.begin == cx.inbuf && raw.size() == PIECE;
+    bool whole_piece = compiler.is_cut(source) && raw.size() == PIECE;
     rest_of_line = seen.piece != 0;
     if (rest_of_line && !seen.piece_told)
         warn_at(
             LONG_LINE, {seen.piece, 0, 0}, {},
             "line of more than 253 characters: the rest is read as a line of its own, and later lines count one more");
     seen.piece_told = rest_of_line;
-    seen.piece = whole_piece ? cx.linenum : 0;
+    seen.piece = whole_piece ? compiler.line_number() : 0;
     if (!seen.carriage_returns)
         watch_returns(source);
 }
 
 /* Where the next one stands is found once, however many lines stand before it; as the reader's marks are. */
 void session::watch_returns(const source_line &source) {
-    const source_file &file = cx.cdb_fp;
-    bool cut = source.begin == cx.inbuf;
-    bool filled_anew = source.begin == file.buffer.data();
+    bool cut = compiler.is_cut(source);
+    bool filled_anew = compiler.begins_buffer(source);
     if (cut || filled_anew || seen.next_return < source.begin) {
-        const char *end = cut ? source.end : file.buffer.data() + file.end;
+        const char *end = cut ? source.end : compiler.buffer_end();
         const void *found = memchr(source.begin, '\r', static_cast<size_t>(end - source.begin));
         seen.next_return = found == nullptr ? end : static_cast<const char *>(found);
     }
@@ -60,7 +59,8 @@ void session::watch_returns(const source_line &source) {
     auto at = static_cast<size_t>(next - source.begin);
     seen.carriage_returns = true;
     const char *where = at + 1 == raw.size() ? "carriage return at the end of a line" : "carriage return within a line";
-    warn(CARRIAGE_RETURN, {cx.linenum, at + 1, 1}, std::string(where) + ", which belongs to the line's text");
+    warn(CARRIAGE_RETURN, {compiler.line_number(), at + 1, 1},
+         std::string(where) + ", which belongs to the line's text");
 }
 
 /* ---- Stanzas -------------------------------------------------------------------------------------------------- */
@@ -69,10 +69,10 @@ void session::watch_returns(const source_line &source) {
 static name_list unchecked_missing(session &check) {
     int kind = check.kind;
     const srtable_ctrl &table = sc_tables[index_of(kind)];
-    const stanza_state &state = check.cx.stanzas[index_of(kind)];
-    name_list names = missing_names(table, state.req_mask);
+    vx_uint32_t given = check.compiler.required_seen(kind);
+    name_list names = missing_names(table, given);
     if (is_sd_kind(kind))
-        return (state.req_mask & ELEMENT_INDEX) == 0 && names.size() == 1 ? names : name_list();
+        return (given & ELEMENT_INDEX) == 0 && names.size() == 1 ? names : name_list();
     if (is_attribute_kind(kind) || kind == SC_CLASS_ACTION || kind == SC_RESOURCE_ACTION)
         return {};
     std::erase(names, "ResourceManager"); /* an error of its own */
@@ -95,7 +95,7 @@ void session::watch_complete() {
 
 void session::watch_stanza_end(int next_kind) {
     bool map_again = kind == SC_CLASS_TO_MANAGER_MAPPING && next_kind == kind; /* which is an error */
-    if (kind >= 0 && !skipping && !map_again && !cx.stanzas[index_of(kind)].broken)
+    if (kind >= 0 && !skipping && !map_again && !stanzas[index_of(kind)].broken)
         watch_complete();
     bool runs_on = next_kind >= 0 && is_attribute_run(next_kind);
     bool reported = seen.sd_attribute.line == 0;
@@ -106,7 +106,7 @@ void session::watch_stanza_end(int next_kind) {
     if (!seen.sd_run && out.errors == 0)
         warn_at(SD_WITHOUT_RUN, seen.sd_attribute, seen.sd_source,
                 "attribute of structured data without elements: it has no value");
-    if (seen.sd_run && line.line == nullptr && cx.attr_dflt_val != nullptr)
+    if (seen.sd_run && line.line == nullptr && compiler.run_makes_value())
         warn_at(SD_RUN_AT_END, seen.sd_attribute, seen.sd_source,
                 "the elements end the file: the attribute is completed before them and has no value");
     seen.sd_attribute = {};
@@ -114,19 +114,17 @@ void session::watch_stanza_end(int next_kind) {
 }
 
 void session::watch_header(int new_kind) {
-    bool begins_run = is_sd_kind(new_kind) && (cx.cb_sd_def.sd_cb_ID == 0 || kind != new_kind);
+    bool begins_run = is_sd_kind(new_kind) && (!compiler.run_is_open() || kind != new_kind);
     if (begins_run)
         seen.known[index_of(new_kind)].names.clear();
-    if (begins_run && is_action_run(new_kind) && !owner_lost && cx.cb_rsrc_action.ac_cb_ID == 0 &&
-        cx.cb_rsrc_actionC.ac_cb_ID == 0)
+    if (begins_run && is_action_run(new_kind) && !owner_lost && !compiler.is_open(SC_RESOURCE_ACTION) &&
+        !compiler.is_open(SC_CLASS_ACTION))
         warn(STRAY_RUN, all_of_line(), "no action is open: these elements belong to nothing");
-    if (new_kind != SC_CONTROL_DEFINITION || cx.cb_rsrc_class.rc_cb_ID == 0)
+    if (new_kind != SC_CONTROL_DEFINITION || !compiler.class_is_open())
         return;
     for (int each : {SC_PERSISTENT_RESOURCE_ATTRIBUTE, SC_PERSISTENT_CLASS_ATTRIBUTE, SC_DYNAMIC_RESOURCE_ATTRIBUTE,
                      SC_DYNAMIC_CLASS_ATTRIBUTE}) {
-        vx_uint32_t identifier = 0;
-        memcpy(&identifier, sc_tables[index_of(each)].sc_cb(cx), sizeof identifier);
-        if (identifier != 0 && !class_forged && !cx.stanzas[index_of(each)].broken)
+        if (compiler.is_open(each) && !class_forged && !stanzas[index_of(each)].broken)
             warn(CUT_SHORT, all_of_line(),
                  "a second class ends the latest " + quoted(sc_tables[index_of(each)].sc_name) +
                      " unchecked and without its defaults",
@@ -160,18 +158,18 @@ void session::watch_permission(std::string_view text, const place &at) {
 
 /* Where the element's default is asked for, the compiler may refuse the type at the run's end. */
 void session::watch_element_type(std::string_view text, const place &at) {
-    bool unknown = data_type(cx) == VX_UNKNOWN;
+    bool unknown = compiler.data_type() == VX_UNKNOWN;
     note_type(text);
-    if (cx.attr_dflt_val != nullptr && (unknown || text == "SBS"))
+    if (compiler.run_makes_value() && (unknown || text == "SBS"))
         odd_elements.push_back({at, std::string(text), raw});
     else if (unknown)
         warn(ELEMENT_TYPE, at, "unknown data type: the element gets none", {at, language::type_suggestion(text, true)});
 }
 
 void session::watch_attribute() {
-    const table_attrs &attr = *cx.latest.attr;
+    const table_attrs &attr = *latest.attr;
     std::string_view text = value_text();
-    place at = value_part(0, cx.latest.length);
+    place at = value_part(0, latest.length);
     watch_quotes();
     if (stanzas[index_of(kind)].misplaced)
         return; /* the value may be another attribute's */
@@ -194,7 +192,7 @@ void session::watch_attribute() {
         return watch_permission(text, at);
     case AT_DATA_TYPE:
         note_type(text);
-        if (scalar_vx(data_type(cx)) == VX_SD_PTR) {
+        if (scalar_vx(compiler.data_type()) == VX_SD_PTR) {
             seen.sd_attribute = stanzas[index_of(kind)].header;
             seen.sd_source = stanzas[index_of(kind)].source;
             seen.sd_run = false;
@@ -211,10 +209,10 @@ void session::watch_attribute() {
 
 void session::watch_name() {
     std::string_view text = value_text();
-    place at = value_part(0, cx.latest.length);
-    std::string_view attr = cx.latest.attr->ta_name;
+    place at = value_part(0, latest.length);
+    std::string_view attr = latest.attr->ta_name;
     if (attr == "VariableClass" && kind == SC_RESOURCE_VARIABLE_CLASS)
-        seen.defined_variable_classes.of(text) = cx.linenum;
+        seen.defined_variable_classes.of(text) = compiler.line_number();
     if (attr == "VariableClass" && kind != SC_RESOURCE_VARIABLE_CLASS)
         watch_variable_class(text, at);
     known_values &known = seen.known[index_of(kind)];
@@ -226,7 +224,7 @@ void session::watch_variable_class(std::string_view text, const place &at) {
     int &first = seen.variable_class_names.of(text);
     if (first == 0)
         seen.variable_classes.push_back({at, std::string(text), raw});
-    first = cx.linenum;
+    first = compiler.line_number();
 }
 
 void session::watch_first(warning_id id, int &first, const place &at, const char *what) {
@@ -234,14 +232,14 @@ void session::watch_first(warning_id id, int &first, const place &at, const char
         warn(id, at, "another " + quoted(sc_tables[index_of(kind)].sc_name) + " has the same " + what,
              {{first, 0, 0}, "first given here"});
     else
-        first = cx.linenum;
+        first = compiler.line_number();
 }
 
 void session::watch_range() {
     place at = here(mark_kind::text);
-    if (!is_numeric(data_type(cx)))
+    if (!is_numeric(compiler.data_type()))
         return;
-    if (kind == SC_DYNAMIC_CLASS_ATTRIBUTE && cx.cb_rsrc_dattr.ra_cb_ID != 0)
+    if (kind == SC_DYNAMIC_CLASS_ATTRIBUTE && compiler.is_open(SC_DYNAMIC_RESOURCE_ATTRIBUTE))
         warn(RANGE_ELSEWHERE, at, "this Range goes to the `DynamicResourceAttribute` that is still open",
              {stanzas[SC_DYNAMIC_RESOURCE_ATTRIBUTE].header, "begun here"});
     else
@@ -250,9 +248,10 @@ void session::watch_range() {
 
 /* After what may have completed dynamic attributes: the completion of either kind settles all ranges. */
 void session::ranges_settled(bool resource_was_open, bool class_was_open, int next_kind) {
-    bool of_resource =
-        resource_was_open && (next_kind == SC_DYNAMIC_RESOURCE_ATTRIBUTE || cx.cb_rsrc_dattr.ra_cb_ID == 0);
-    bool of_class = class_was_open && (next_kind == SC_DYNAMIC_CLASS_ATTRIBUTE || cx.cb_rsrc_dattrC.ra_cb_ID == 0);
+    bool of_resource = resource_was_open &&
+                       (next_kind == SC_DYNAMIC_RESOURCE_ATTRIBUTE || !compiler.is_open(SC_DYNAMIC_RESOURCE_ATTRIBUTE));
+    bool of_class =
+        class_was_open && (next_kind == SC_DYNAMIC_CLASS_ATTRIBUTE || !compiler.is_open(SC_DYNAMIC_CLASS_ATTRIBUTE));
     if ((!of_resource && !of_class) || next_kind == SC_CONTROL_DEFINITION)
         return;
     int completed = of_resource ? SC_DYNAMIC_RESOURCE_ATTRIBUTE : SC_DYNAMIC_CLASS_ATTRIBUTE;

@@ -7,12 +7,14 @@
 
 #include "cdb.h"
 #include "compiler/cdgen_error.h"
+#include "compiler/cdgen_observer.h"
 #include "format/names.h"
 #include "language/name_index.h"
 
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <cstdio>
 #include <cstdlib>
 #include <cstring>
 #include <deque>
@@ -374,7 +376,6 @@ struct stanza_state {
     vx_uint32_t req_mask = 0; /* required attributes seen */
     vx_uint32_t opt_mask = 0; /* optional attributes seen, with their OPTIONAL bit */
     dflt_tbl dflt;
-    bool broken = false; /* has been reported: nothing is missed in it any more. A check of sources says so */
 };
 
 /* ---- The compilation ------------------------------------------------------------------------------------------- */
@@ -431,13 +432,6 @@ struct free_memory {
     }
 };
 
-/* What an attribute line says, once its name is known. The value is taken apart later. */
-struct attr_place {
-    const table_attrs *attr = nullptr;
-    const char *value = nullptr;
-    size_t length = 0;
-};
-
 /* All state of one compilation. A staging record is open while its first word, the cb_ID, is not 0. */
 struct cdgen {
     cdgen() = default;
@@ -452,10 +446,8 @@ struct cdgen {
     const char *cdefsrc = nullptr;
     const char *cdefname = nullptr;
 
-    /* For a check of sources, which catches what ends a compilation and goes on with the next line. */
-    bool checking = false; /* an error leaves the source open, and nothing is printed */
-    int completing = -1;   /* stanza_id of the completion that has begun and not ended; one for all structured data */
-    attr_place latest;     /* of the latest attribute line */
+    line_observer *observer = nullptr;
+    FILE *explanations = stdout; /* where the traces go that explain an error; null: nowhere */
 
     /* errno as far as number conversions see it: they alone set it, nothing clears it. So an overflow makes a later 0
      * or limit value fail, as it always did, and nothing else does. */
@@ -556,9 +548,6 @@ int cdgen_main(int argc, char **argv);
 void compile(cdgen &cx);
 
 void cache_input_data(cdgen &cx, const char *filename);
-/* What the end of input asks for, up to the sizing of the image, in this order. */
-using closing_step = void (*)(cdgen &);
-extern const std::span<const closing_step> closing_steps;
 /* il: an attribute line without comment and newline, taken apart in place. */
 void save_attr(cdgen &cx, char *il, int table_id);
 

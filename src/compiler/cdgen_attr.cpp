@@ -45,9 +45,13 @@ const table_attrs &known_attr(cdgen &cx, const srtable_ctrl &scp, std::string_vi
     return *attr;
 }
 
+bool missing_excused(const cdgen &cx, const srtable_ctrl &scp) {
+    return cx.observer != nullptr && cx.observer->excuses_missing(static_cast<int>(&scp - sc_tables.data()));
+}
+
 /* Optional attributes follow the required ones; most may stand once. */
 void count_optional(cdgen &cx, const srtable_ctrl &scp, stanza_state &state, const table_attrs &attr) {
-    if (state.req_mask != scp.req_mask_cmplt && !state.broken)
+    if (state.req_mask != scp.req_mask_cmplt && !missing_excused(cx, scp))
         source_error(cx, MSG_OPTIONAL_TOO_EARLY, attr.ta_name);
     if ((state.opt_mask & attr.req_bit & ~OPTIONAL) != 0 && !attr.dup_allowed)
         source_error(cx, MSG_REPEATED_ATTRIBUTE, attr.ta_name);
@@ -75,10 +79,11 @@ void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, s
     if (value == nullptr)
         return;
     const table_attrs &attr = known_attr(cx, scp, name);
-    cx.latest = {&attr, value, length};
+    if (cx.observer != nullptr)
+        cx.observer->attribute_read({&attr, value, length});
     if (*value == '\0') {
-        if (!cx.checking)
-            printf("In file %s: ", cx.cdefsrc);
+        if (cx.explanations != nullptr)
+            fprintf(cx.explanations, "In file %s: ", cx.cdefsrc);
         source_error(cx, MSG_NO_VALUE, attr.ta_name);
     }
     if (cx.debugLevel >= 2)

@@ -311,8 +311,8 @@ void check_sd_index(const attr_line &line) {
     if (str_to_vx(cx, &index, VX_UINT32, line.value, cx.line_texts) == 0)
         cx.curr_sdeli = static_cast<int>(index.val_uint32);
     if (cx.curr_sdeli != cx.expected_sdeli) {
-        if (!cx.checking)
-            printf("curr_sdel = %d, expected_sdeli = %d\n", cx.curr_sdeli, cx.expected_sdeli);
+        if (cx.explanations != nullptr)
+            fprintf(cx.explanations, "curr_sdel = %d, expected_sdeli = %d\n", cx.curr_sdeli, cx.expected_sdeli);
         source_error(cx, MSG_INDEX_NOT_CONSECUTIVE);
     }
     cx.expected_sdeli = static_cast<int>(static_cast<unsigned>(cx.curr_sdeli) + 1);

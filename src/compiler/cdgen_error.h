@@ -16,6 +16,9 @@ struct fatal_exit {
     const char *detail2;
     int line; /* 0: none */
     int code; /* exit status */
+
+    /* The stanza_id of the record whose completion failed, -1 if that did not; all structured data have one. */
+    int completing = -1;
 };
 
 /* The message and its details in the order in which they are printed, without separators; none is null. There must be a
@@ -29,5 +32,15 @@ std::array<const char *, 3> words_of(const fatal_exit &failure);
 
 /* The usual case: a message about the current line, status 1. */
 [[noreturn]] void source_error(cdgen &cx, message_id id, const char *detail1 = nullptr, const char *detail2 = nullptr);
+
+/* Runs the completion of a kind's record; a failure will say so. */
+template <class Complete> void completing(int kind, Complete complete) {
+    try {
+        complete();
+    } catch (fatal_exit &failure) {
+        failure.completing = kind;
+        throw;
+    }
+}
 
 #endif

@@ -23,15 +23,15 @@ constexpr action_kind class_kind = {SC_CLASS_ACTION, &cdgen::cb_rsrc_actionC, &r
 constexpr message_id NO_CLASS = MSG_NO_CLASS_FOR_ACTION; /* deliberately for both kinds */
 
 void complete_action(cdgen &cx, const action_kind &kind) {
-    rsrc_action_t &action = cx.*kind.record;
-    cx.completing = kind.id;
-    require_class(cx, NO_CLASS);
-    require_complete(cx, kind.id);
-    if (!was_given(cx.stanzas[kind.id], PERMISSION_BIT))
-        action.ac_perms = DEFAULT_PERMISSION;
-    append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), action);
-    action.ac_cb_ID = 0;
-    cx.completing = -1;
+    completing(kind.id, [&] {
+        rsrc_action_t &action = cx.*kind.record;
+        require_class(cx, NO_CLASS);
+        require_complete(cx, kind.id);
+        if (!was_given(cx.stanzas[kind.id], PERMISSION_BIT))
+            action.ac_perms = DEFAULT_PERMISSION;
+        append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), action);
+        action.ac_cb_ID = 0;
+    });
 }
 
 void start_action(cdgen &cx, const action_kind &kind) {

@@ -94,27 +94,27 @@ void open_dattr(cdgen &cx, const dattr_kind &kind) {
 }
 
 void show_masks(cdgen &cx, stanza_id id) {
-    if (cx.checking || cx.stanzas[id].req_mask == sc_tables[id].req_mask_cmplt)
+    if (cx.explanations == nullptr || cx.stanzas[id].req_mask == sc_tables[id].req_mask_cmplt)
         return;
-    printf("scp->req_mask:         %x\n", cx.stanzas[id].req_mask);
-    printf("scp->req_mask_cmplt:   %x\n", sc_tables[id].req_mask_cmplt);
+    fprintf(cx.explanations, "scp->req_mask:         %x\n", cx.stanzas[id].req_mask);
+    fprintf(cx.explanations, "scp->req_mask_cmplt:   %x\n", sc_tables[id].req_mask_cmplt);
 }
 
 void complete_dattr(cdgen &cx, const dattr_kind &kind) {
-    rsrc_dattr_t &attr = cx.*kind.record;
-    cx.completing = kind.id;
-    require_class(cx, NO_CLASS);
-    if (kind.shows_masks)
-        show_masks(cx, kind.id);
-    require_complete(cx, kind.id);
-    settle_valid_vals(attr, valid_vals_found(cx, kind));
-    settle_range(cx, attr);
-    settle_initial_value(cx, kind, attr);
-    settle_group(attr, cx.stanzas[kind.id]);
-    note_stray_range(cx, attr, kind.records);
-    append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), attr);
-    attr.ra_cb_ID = 0;
-    cx.completing = -1;
+    completing(kind.id, [&] {
+        rsrc_dattr_t &attr = cx.*kind.record;
+        require_class(cx, NO_CLASS);
+        if (kind.shows_masks)
+            show_masks(cx, kind.id);
+        require_complete(cx, kind.id);
+        settle_valid_vals(attr, valid_vals_found(cx, kind));
+        settle_range(cx, attr);
+        settle_initial_value(cx, kind, attr);
+        settle_group(attr, cx.stanzas[kind.id]);
+        note_stray_range(cx, attr, kind.records);
+        append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), attr);
+        attr.ra_cb_ID = 0;
+    });
 }
 
 void start_dattr(cdgen &cx, const dattr_kind &kind) {

@@ -65,18 +65,18 @@ void open_pattr(cdgen &cx, const pattr_kind &kind) {
 }
 
 void complete_pattr(cdgen &cx, const pattr_kind &kind) {
-    rsrc_pattr_t &attr = cx.*kind.record;
-    cx.completing = kind.id;
-    require_class(cx, kind.no_class);
-    require_complete(cx, kind.id);
-    settle_valid_vals(attr, valid_vals_found(cx, kind));
-    settle_default(cx, kind, attr);
-    if ((attr.ra_props & (REQD_FOR_DEFINE | OPT_FOR_DEFINE)) == 0)
-        attr.ra_props |= INVAL_FOR_DEFINE;
-    settle_group(attr, cx.stanzas[kind.id]);
-    append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), attr);
-    attr.ra_cb_ID = 0;
-    cx.completing = -1;
+    completing(kind.id, [&] {
+        rsrc_pattr_t &attr = cx.*kind.record;
+        require_class(cx, kind.no_class);
+        require_complete(cx, kind.id);
+        settle_valid_vals(attr, valid_vals_found(cx, kind));
+        settle_default(cx, kind, attr);
+        if ((attr.ra_props & (REQD_FOR_DEFINE | OPT_FOR_DEFINE)) == 0)
+            attr.ra_props |= INVAL_FOR_DEFINE;
+        settle_group(attr, cx.stanzas[kind.id]);
+        append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), attr);
+        attr.ra_cb_ID = 0;
+    });
 }
 
 void start_pattr(cdgen &cx, const pattr_kind &kind) {

@@ -90,11 +90,8 @@ vx_uint32_t mk_sd_data_tbl(cdgen &cx, vx_data_type_t sd_type, tbl *dflt_tp) {
 
 void init_sd_tbl(cdgen &cx) {
     require_class(cx, NO_CLASS);
-    if (cx.cb_sd_def.sd_cb_ID != 0) {
-        cx.completing = SC_PATTR_SD_DEFINITION;
-        file_element(cx);
-        cx.completing = -1;
-    }
+    if (cx.cb_sd_def.sd_cb_ID != 0)
+        completing(SC_PATTR_SD_DEFINITION, [&] { file_element(cx); });
     cx.cb_sd_def = {};
     cx.cb_sd_def.sd_cb_ID = CDB_ID_SD_DEF;
     cx.vvdisp.reset();
@@ -104,10 +101,8 @@ void init_sd_tbl(cdgen &cx) {
 void cmplt_sd_tbl(cdgen &cx, const srtable_ctrl *scp) {
     require_class(cx, NO_CLASS);
     init_sd_tbl(cx); /* files the last element */
-    cx.completing = SC_PATTR_SD_DEFINITION;
     if (cx.attr_dflt_val != nullptr)
-        dump_sd_default(cx, scp);
-    cx.completing = -1;
+        completing(SC_PATTR_SD_DEFINITION, [&] { dump_sd_default(cx, scp); });
     if (cx.max_sd_idx != nullptr)
         *cx.max_sd_idx = static_cast<vx_uint16_t>(cx.curr_sdeli);
     cx.curr_sdeli = -1;

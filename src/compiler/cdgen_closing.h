@@ -1,0 +1,14 @@
+/* cdgen_closing.h: what the end of the source asks for. */
+#ifndef CDGEN_CDGEN_CLOSING_H
+#define CDGEN_CDGEN_CLOSING_H
+
+#include "compiler/cdgen.h"
+
+#include <span>
+
+using closing_step = void (*)(cdgen &);
+
+/* Up to the sizing of the image, in this order. */
+extern const std::span<const closing_step> closing_steps;
+
+#endif

@@ -1,0 +1,106 @@
+/* stepwise.h: a compilation for callers that take its steps themselves and continue after an error. Without an error it
+ * does what compile() does, except for writing the database. After one, the caller names what is given up. */
+#ifndef CDGEN_COMPILER_STEPWISE_H
+#define CDGEN_COMPILER_STEPWISE_H
+
+#include "compiler/cdgen_read.h"
+
+class stepwise_compiler {
+public:
+    /* The names must stay as long as the compiler. Nothing is written to the output, but a class without a Name is
+     * named after it. */
+    stepwise_compiler(const char *source, const char *output, line_observer &observer);
+
+    /* ---- Steps; each throws fatal_exit ---- */
+
+    void open();
+    /* The same for a descriptor that is open, or -1 with errno; it is closed with the source. */
+    void open(int fd);
+    source_line next_line();
+    void close();
+
+    /* A header, if no blank is in front, or an attribute line, which is taken apart. If a header fails, the stanza
+     * before it is still the current one. */
+    void take_line(const attr_text &text);
+
+    /* What the end of the source asks for, in this order. */
+    static size_t closing_steps();
+    void take_closing_step(size_t step);
+    void size_image();
+
+    /* ---- State ---- */
+
+    int line_number() const {
+        return cx.linenum;
+    }
+    /* Whether the line is part of a longer one, or ends the source without a newline. */
+    bool is_cut(const source_line &line) const {
+        return line.begin == cx.inbuf;
+    }
+    /* Whether the line is the first one after the reader filled its buffer. */
+    bool begins_buffer(const source_line &line) const {
+        return line.begin == cx.cdb_fp.buffer.data();
+    }
+    const char *buffer_end() const {
+        return cx.cdb_fp.buffer.data() + cx.cdb_fp.end;
+    }
+
+    /* Whether a record of the kind is open. The kinds of structured data share one. */
+    bool is_open(int kind) const;
+    bool run_is_open() const {
+        return cx.cb_sd_def.sd_cb_ID != 0;
+    }
+    bool class_is_open() const {
+        return cx.cb_rsrc_class.rc_cb_ID != 0;
+    }
+    /* The kind of the stanza before the current one; -1: none. */
+    int previous_kind() const;
+    /* The required attributes that a kind's latest stanza has given. */
+    vx_uint32_t required_seen(int kind) const {
+        return cx.stanzas[static_cast<size_t>(kind)].req_mask;
+    }
+    /* The data type that the current stanza has given; unknown if its kind takes none. */
+    vx_data_type_t data_type() const;
+
+    /* The index of the run's latest element, and the one that the next element must have. */
+    int element_index() const {
+        return cx.curr_sdeli;
+    }
+    int expected_index() const {
+        return cx.expected_sdeli;
+    }
+    /* Whether the elements that follow, or that are open, make the value of an attribute. */
+    bool run_makes_value() const {
+        return cx.attr_dflt_val != nullptr;
+    }
+    /* Whether the run's highest index is stored. */
+    bool run_has_highest_index() const {
+        return cx.max_sd_idx != nullptr;
+    }
+    /* errno as the number conversions see it. */
+    int conversion_errno() const {
+        return cx.conv_errno;
+    }
+
+    /* ---- Recoveries ---- */
+
+    /* Opens a class for stanzas that have none. False if there is one. */
+    bool forge_class();
+    /* The open record of a kind is not completed. */
+    void drop_record(int kind);
+    /* The open element lacks nothing any more. */
+    void complete_element();
+    /* The open run is not completed. */
+    void give_up_run();
+    /* Begins a run of a kind whose elements belong to nothing, with its first stanza. */
+    void begin_run_of_nobody(int kind);
+    void expect_index(int index);
+    /* An earlier overflow does not count any more. */
+    void forget_overflow();
+
+private:
+    cdgen cx;
+    cdb_ref_t nobody = {}; /* refers to the elements of a run that belongs to nothing */
+};
+
+#endif

@@ -52,7 +52,7 @@ install(FILES "${CMAKE_CURRENT_BINARY_DIR}/cdgen.pc" DESTINATION "${CMAKE_INSTAL
 foreach(program IN LISTS programs)
   install(FILES man/${program}.1 DESTINATION "${CMAKE_INSTALL_MANDIR}/man1")
 endforeach()
-install(FILES man/cdefsrc.5 man/cdb.5 DESTINATION "${CMAKE_INSTALL_MANDIR}/man5")
+install(FILES man/cdefsrc.5 man/cdef.5 DESTINATION "${CMAKE_INSTALL_MANDIR}/man5")
 install(FILES README.md CHANGELOG.md CONTRIBUTING.md LICENSE SECURITY.md DESTINATION "${CMAKE_INSTALL_DOCDIR}")
 install(DIRECTORY docs examples DESTINATION "${CMAKE_INSTALL_DOCDIR}")
 

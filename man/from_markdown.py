@@ -19,7 +19,7 @@ HERE = pathlib.Path(__file__).resolve().parent
 SECTION = 5
 MADE = [
     ("language.md", "cdefsrc", "source language of resource class definitions"),
-    ("format.md", "cdb", "class definition database, byte by byte"),
+    ("format.md", "cdef", "class definition database, byte by byte"),
 ]
 FILES = """## Files
 
@@ -32,7 +32,7 @@ installed, such as `/usr`:
 | `share/doc/cdgen/examples` | examples, such as `FileSystem.cdefsrc` |
 | `include/cdgen` | headers, such as `cdb.h` |
 """
-ALL_PAGES = (("cdgen", 1), ("cdef", 1), ("cdefsrc", 5), ("cdb", 5))
+ALL_PAGES = (("cdgen", 1), ("cdef", 1), ("cdefsrc", 5), ("cdef", 5))
 DATE = "2026-11-21"  # of the release
 LINE = 72  # characters that a table may take
 PAGES = {document: f"`{name}`({SECTION})" for document, name, what in MADE}
@@ -159,7 +159,7 @@ def code(lines):
 
 def see_also(name):
     """The pages beside this one."""
-    return "## See also\n\n" + ", ".join(f"`{other}`({section})" for other, section in ALL_PAGES if other != name)
+    return "## See also\n\n" + ", ".join(f"`{other}`({section})" for other, section in ALL_PAGES if (other, section) != (name, SECTION))
 
 
 def heading(line):

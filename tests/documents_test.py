@@ -11,7 +11,7 @@ import unittest
 from programs import PROGRAMS, EXAMPLES
 from documents import DOCUMENTS, PAGES, PROJECT, broken_links, sources, tables, text_of
 
-WITH_SOURCES = {"README.md", "language.md", "format.md", "cdgen.1", "cdefsrc.5", "cdb.5"}
+WITH_SOURCES = {"README.md", "language.md", "format.md", "cdgen.1", "cdefsrc.5", "cdef.5"}
 
 
 def made_by(script, *arguments):
@@ -42,7 +42,7 @@ class Sources(unittest.TestCase):
         self.assertLessEqual(WITH_SOURCES, found)
 
     def test_pages_show_the_same_classes_as_documents(self):
-        for document, page in (("language.md", "cdefsrc.5"), ("format.md", "cdb.5")):
+        for document, page in (("language.md", "cdefsrc.5"), ("format.md", "cdef.5")):
             shown = [self.compile(re.sub(r"(?m)^ {8}", "\t", source)) for source in sources(PROJECT / "man" / page)]
             meant = [self.compile(source) for source in sources(PROJECT / "docs" / document)]
             self.assertEqual([len(image) for image in shown], [len(image) for image in meant], page)
@@ -71,7 +71,7 @@ class Tables(unittest.TestCase):
         return re.escape(re.sub(r"\[([^\]]*)\]\([^)]*\)", r"\1", cell).replace("`", "").replace(r"\|", "|"))
 
     def test_each_has_its_headings_on_the_page(self):
-        for document, page in (("language.md", "cdefsrc.5"), ("format.md", "cdb.5")):
+        for document, page in (("language.md", "cdefsrc.5"), ("format.md", "cdef.5")):
             text, at = text_of(PROJECT / "man" / page), 0
             for head, *rows in tables((PROJECT / "docs" / document).read_text()):
                 if len(head) > 1:
@@ -122,7 +122,7 @@ class Release(unittest.TestCase):
 class Made(unittest.TestCase):
     def test_pages_are_up_to_date(self):
         made = made_by("man/from_markdown.py")
-        self.assertEqual(sorted(made), ["cdb.5", "cdefsrc.5"])
+        self.assertEqual(sorted(made), ["cdef.5", "cdefsrc.5"])
         for name, text in made.items():
             self.assertTrue((PROJECT / "man" / name).read_text() == text, f"{name}: run man/from_markdown.py")
 

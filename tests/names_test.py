@@ -153,13 +153,14 @@ class Pages(Names):
 
     def test_database_page_has_every_field(self):
         for record, fields in known_fields(self.names).items():
-            self.assertEqual(self.missing("cdb.5", fields), [], record)
+            self.assertEqual(self.missing("cdef.5", fields), [], record)
 
     def test_each_names_the_others(self):
         for page in PAGES:
             said = re.split(r"(?im)^\.SH \"?see also\"?$", text_of(page))[1]
-            others = {other.stem for other in PAGES} - {page.stem}
-            self.assertEqual(set(re.findall(r"\b(cdgen|cdef|cdefsrc|cdb)\b", said)), others, page)
+            others = {other.name for other in PAGES} - {page.name}
+            named = re.findall(r"\b(cdgen|cdef|cdefsrc)\b[( ](\d)", said)
+            self.assertEqual({f"{name}.{section}" for name, section in named}, others, page)
 
     def test_whole_class_has_every_form_of_stanza(self):
         """Who knows nothing but the page finds a complete class in it."""

@@ -71,8 +71,8 @@ def check_tables(root):
     codes = [row[0] for row in warnings]
     problems += [f"{code} is given twice" for code in set(codes) if codes.count(code) > 1]
     example = expected_of(CASES / "disk.expect").get("stderr")
-    if f"```\n{example}```\n" not in (root / "README.md").read_text():
-        problems.append("README.md: the example is not what tests/cdef/check/disk.expect says")
+    if f"```\n{example}```\n" not in (root / "docs/check.md").read_text():
+        problems.append("docs/check.md: the example is not what tests/cdef/check/disk.expect says")
     if len(warnings) < 20:
         problems.append("the table has not been found")
     return problems

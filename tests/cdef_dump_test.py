@@ -30,11 +30,9 @@ import pytest
 import cdb_image
 import cdef_dump_listing
 import compare
-import documents
-from programs import EXAMPLES, PROGRAMS, PROJECT, TESTS
+from programs import EXAMPLES, PROGRAMS, TESTS
 
 CASES = TESTS / "cdef" / "dump"
-README = PROJECT / "README.md"
 TIMEOUT = 60
 OK, TROUBLE = 0, 2
 OTHER = {"little": "big", "big": "little"}
@@ -248,35 +246,6 @@ def test_no_database_is_refused():
     expect(dump(b"", "--hex"), "", "bytes of an empty file")
     regions = regions_of(dump(b"something else", "--hex"))
     expect(regions, [(0, b"something else", "unreached")], "bytes of something else")
-
-
-def readme_commands():
-    """(arguments, what is shown) of the commands that the README gives cdef."""
-    block = next(block for block in documents.blocks(README) if "$ cdef dump" in block)
-    parts = re.split(r"^\$ cdef ([^>\n]*).*\n", block, flags=re.M)[1:]
-    return list(zip(parts[::2], parts[1::2]))
-
-
-def test_readme_shows_what_there_is():
-    """The README's commands print what it says, of the class that it shows; it leaves out lines at "..."."""
-    source = documents.sources(README)[0]
-    changed = source.replace("DefaultValue=4096", "DefaultValue=8192")
-    expect([command.split()[0] for command, _ in readme_commands()], ["verify", "dump", "diff", "source"], "commands")
-    with tempfile.TemporaryDirectory() as name:
-        for directory, text in ((name, source), (f"{name}/new", changed)):
-            os.makedirs(directory, exist_ok=True)
-            (pathlib.Path(directory) / "disk.cdefsrc").write_text(text)
-            subprocess.run([PROGRAMS.cdgen, "disk.cdefsrc", "disk.cdef"], cwd=directory, check=True, timeout=TIMEOUT)
-        for command, shown in readme_commands():
-            result = subprocess.run(
-                [PROGRAMS.cdef, *command.split()], cwd=name, capture_output=True, text=True, timeout=TIMEOUT
-            )
-            expect((result.returncode, result.stderr), (int(command.startswith("diff")), ""), command)
-            if "..." not in shown and not command.startswith("source"):
-                expect(result.stdout, shown, command)
-            for lines in re.split(r"^ *\.\.\.\n", shown, flags=re.M):
-                expect(lines in result.stdout, True, f"{command}: {lines!r} in {result.stdout!r}")
-        expect(result.stdout.startswith("#"), True, "a source")
 
 
 def test_wrong_checksum_is_told():

@@ -4,6 +4,7 @@
 #define CDGEN_CDEF_DUMP_H
 
 #include "cdef/support/input.h"
+#include "format/records.h"
 
 #include <array>
 #include <variant>
@@ -59,58 +60,14 @@ std::string as_text(const fact &f);
 
 /* ---- Fields ---------------------------------------------------------------------------------------------------- */
 
-/* What a record's field stands for, if a plain number or reference does not say it all. */
-enum class meaning : std::uint8_t {
-    PLAIN,
-    SIGNED,
-    BITS,
-    MARK, /* four characters */
-    TIME,
-    CHECKSUM,
-    SECTION_TYPE,
-    CLASS_PROPERTIES,
-    PERSISTENT_PROPERTIES,
-    DYNAMIC_PROPERTIES,
-    ACTION_PROPERTIES,
-    PERMISSIONS,
-    DATA_TYPE,
-    VARIABLE_TYPE,
-    VERSION,
-    NONE_IS_0,
-    NONE_IS_255,
-    NONE_IS_65535,
-    LOCATOR, /* of an attribute; 65535: none */
-    MANAGER,
-    OFFSET, /* says where something stands, and nothing else */
-    UNUSED  /* a reference that is 0 in every file */
-};
-
-struct record_format {
-    std::string_view record;
-    std::span<const cdb::field> fields;
-    std::size_t size;            /* bytes; of a list and a class hash, without the entries */
-    std::string_view name_field; /* leads to the record's name; empty: it has none */
-};
-
-/* All records that a file may hold. */
-extern const std::span<const record_format> record_formats;
-
-/* Of an unknown record: without fields. */
-const record_format &format_of(std::string_view record);
-
-/* The field of that name, or null. */
-const cdb::field *find_field(const record_format &format, std::string_view name);
-
-meaning meaning_of(std::string_view record, const cdb::field &f);
-
 /* The number in a field of an area. */
 std::uint32_t number_in(const cdb::bytes &area, std::size_t at, const cdb::field &f);
 
 /* What it means as far as it can be told from the number alone. */
-fact fact_of(meaning as, std::uint32_t number);
+fact fact_of(cdb::meaning as, std::uint32_t number);
 
 /* The data type that a record names for its values; VX_UNKNOWN if it names none. */
-vx_data_type_t data_type_in(const record_format &format, const cdb::bytes &area, std::size_t at);
+vx_data_type_t data_type_in(const cdb::record_format &format, const cdb::bytes &area, std::size_t at);
 
 /* A value that stands in its cell, or is none. */
 fact fact_of(const cdb::value &value);

@@ -56,6 +56,11 @@ vx_data_type_t type_at(const std::unordered_map<std::size_t, vx_data_type_t> &ty
     return found == types.end() ? VX_UNKNOWN : found->second;
 }
 
+/* What the field of a region means. */
+const cdb::field_fact &fact_row(const cdb::region &r) {
+    return cdb::format_of(r.record).fact_of(*r.what);
+}
+
 /* Where a record begins in the file. */
 std::size_t start_of(const cdb::region &r) {
     return r.offset - r.what->offset;
@@ -95,7 +100,7 @@ void hex_form::note_types(const cdb::region &r) {
             arrays.try_emplace(place_of(strings) + word, cdb::element_type(type));
     } else if (r.what->to == cdb::target::valid_vals) {
         const cdb::bytes &table = tables(r).valid_vals;
-        vx_data_type_t type = data_type_in(format_of(r.record), db.file(), start_of(r));
+        vx_data_type_t type = data_type_in(cdb::format_of(r.record), db.file(), start_of(r));
         if (word < table.size())
             lists.try_emplace(place_of(table) + word, cdb::element_type(type));
     }
@@ -139,7 +144,7 @@ std::string hex_form::meaning_of_reference(const cdb::region &r) {
         return "";
     if (word == CDB_NONE)
         return "none";
-    if (r.what->to == cdb::target::none || meaning_of(r.record, *r.what) == meaning::UNUSED)
+    if (r.what->to == cdb::target::none || fact_row(r).as == cdb::meaning::UNUSED)
         return std::to_string(word);
     const cdb::class_tables &into = tables(r);
     if (r.what->to == cdb::target::section)
@@ -155,9 +160,9 @@ std::string hex_form::meaning_of_reference(const cdb::region &r) {
 std::string hex_form::meaning_of_field(const cdb::region &r) {
     switch (r.what->kind) {
     case cdb::field_kind::number: {
-        meaning as = meaning_of(r.record, *r.what);
+        cdb::meaning as = fact_row(r).as;
         std::uint32_t number = number_in(db.file(), start_of(r), *r.what);
-        if (as == meaning::OFFSET)
+        if (as == cdb::meaning::OFFSET)
             return place_text(db.file(), number);
         return as_text(fact_of(as, number));
     }

@@ -2,6 +2,7 @@
 
 #include "cdef/dump/dump.h"
 
+#include "format/sections.h"
 #include "text/shown.h"
 
 #include <unordered_map>
@@ -11,69 +12,9 @@ namespace cdef::dump {
 
 namespace {
 
-/* The lists of a class's side tables. */
-struct list_kind {
-    cdb::target to;
-    std::string_view record;
-    std::string_view entry;
-    std::string_view entries_field;
-    const char *entry_title;
-    std::uint32_t id;
-};
-
-constexpr list_kind list_kinds[] = {
-    {cdb::target::variety_lists, "variety_list_t", "vl_entry_t", "vl_values", "variety", CDB_ID_VARIETY_LIST},
-    {cdb::target::valid_vals, "valid_values_t", "vv_entry_t", "vv_values", "valid value", CDB_ID_VALID_VALUES},
-    {cdb::target::sd_defs, "sd_def_t", "sd_field_t", "sd_fields", "element", CDB_ID_SD_DEF},
-};
-
-constexpr std::size_t LIST_COUNT = 4; /* where it stands, in all three */
-static_assert(offsetof(variety_list_t, vl_count) == LIST_COUNT && offsetof(valid_values_t, vv_count) == LIST_COUNT &&
-              offsetof(sd_def_t, sd_count) == LIST_COUNT);
-
-/* The records that a class has tables of. */
-struct class_table {
-    cdb_ref_t rsrc_class_t::*place;
-    std::uint16_t rsrc_class_t::*count;
-    std::string_view record;
-    std::string_view key;
-    const char *title;
-};
-
-constexpr class_table class_tables[] = {
-    {&rsrc_class_t::u_rc_pattrsC, &rsrc_class_t::rc_num_pattrsC, "rsrc_pattr_t", "persistent_class_attributes",
-     "persistent class attribute"},
-    {&rsrc_class_t::u_rc_dattrsC, &rsrc_class_t::rc_num_dattrsC, "rsrc_dattr_t", "dynamic_class_attributes",
-     "dynamic class attribute"},
-    {&rsrc_class_t::u_rc_pattrs, &rsrc_class_t::rc_num_pattrs, "rsrc_pattr_t", "persistent_resource_attributes",
-     "persistent resource attribute"},
-    {&rsrc_class_t::u_rc_dattrs, &rsrc_class_t::rc_num_dattrs, "rsrc_dattr_t", "dynamic_resource_attributes",
-     "dynamic resource attribute"},
-    {&rsrc_class_t::u_rc_actionsC, &rsrc_class_t::rc_num_actionsC, "rsrc_action_t", "class_actions", "class action"},
-    {&rsrc_class_t::u_rc_actions, &rsrc_class_t::rc_num_actions, "rsrc_action_t", "resource_actions",
-     "resource action"},
-    {&rsrc_class_t::u_rc_errors, &rsrc_class_t::rc_num_errors, "rsrc_error_t", "errors", "error"},
-    {&rsrc_class_t::u_rc_depends, &rsrc_class_t::rc_num_depends, "rsrc_depend_t", "dependencies", "dependency"},
-};
-
-struct section_kind {
-    cdb_dsect_type_t type;
-    std::string_view record;
-    std::string_view key;
-    const char *title;
-};
-
-constexpr section_kind section_kinds[] = {
-    {CDB_DSECT_CLASS, "rsrc_class_t", "class", "class"},
-    {CDB_DSECT_RSRC_MGR, "rsrc_mgr_t", "manager", "manager"},
-    {CDB_DSECT_CMMAP, "rsrc_cmmap_t", "map", "map"},
-    {CDB_DSECT_VAR_CLASS, "rsrc_variable_class_t", "variable_class", "variable class"},
-    {CDB_DSECT_CLASS_HASH, "rsrc_class_hash_t", "class_hash", "class hash"},
-};
-
 /* A record in an area, and what its references lead into. */
 struct record_at {
-    const record_format &format;
+    const cdb::record_format &format;
     cdb::bytes area;
     std::size_t at;
     cdb::class_tables tables;
@@ -95,7 +36,7 @@ public:
 
 private:
     void show_section(std::size_t index);
-    void show_root(std::size_t index, const section_kind &kind);
+    void show_root(std::size_t index, const cdb::section_kind &kind);
     void show_class_tables(const cdb::resource_class &rc);
     void show_variables(const cdb::variable_class &vc);
     void show_hash_blocks(const cdb::bytes &section);
@@ -124,6 +65,11 @@ private:
     named_by_number variables; /* dynamic attributes, by variable ID */
     named_by_number managers;
 };
+
+/* The name of the field where a list's entries begin. */
+std::string_view entries_of(const cdb::record_format &list) {
+    return list.fields.back().name;
+}
 
 label same(std::string_view name) {
     return {name, std::string(name)};
@@ -207,7 +153,7 @@ void walker::show_value(const label &what, const cdb::value &value, std::size_t 
 /* ---- Records --------------------------------------------------------------------------------------------------- */
 
 void walker::open(const record_at &r, std::string_view key, std::string title) {
-    if (const cdb::field *name = find_field(r.format, r.format.name_field)) {
+    if (const cdb::field *name = r.format.name) {
         auto place = r.area.number<std::uint32_t>(r.at + name->offset);
         if (place != CDB_NONE)
             title += " " + text::quoted(r.tables.strings.text(std::size_t{place}));
@@ -252,25 +198,25 @@ void walker::show_fields(const record_at &r) {
 }
 
 void walker::show_number(const record_at &r, const cdb::field &f) {
-    meaning as = meaning_of(r.format.record, f);
+    cdb::meaning as = r.format.fact_of(f).as;
     std::uint32_t number = number_in(r.area, r.at, f);
     fact shown = fact_of(as, number);
-    if (as == meaning::CHECKSUM)
+    if (as == cdb::meaning::CHECKSUM)
         shown = sum;
-    if (as == meaning::OFFSET && !with_offsets)
+    if (as == cdb::meaning::OFFSET && !with_offsets)
         return;
-    if (as == meaning::LOCATOR && !std::holds_alternative<none>(shown))
+    if (as == cdb::meaning::LOCATOR && !std::holds_alternative<none>(shown))
         shown = locator(r.tables, number);
-    if (as == meaning::MANAGER)
+    if (as == cdb::meaning::MANAGER)
         shown = found_in(managers, number);
     out.add(same(f.name), shown);
 }
 
 void walker::show_reference(const record_at &r, const cdb::field &f) {
-    meaning as = meaning_of(r.format.record, f);
+    cdb::meaning as = r.format.fact_of(f).as;
     auto place = r.area.number<std::uint32_t>(r.at + f.offset);
-    if (as == meaning::OFFSET || as == meaning::UNUSED) {
-        if (with_offsets || (as == meaning::UNUSED && place != 0))
+    if (as == cdb::meaning::OFFSET || as == cdb::meaning::UNUSED) {
+        if (with_offsets || (as == cdb::meaning::UNUSED && place != 0))
             show_place(r, f);
     } else if (f.to != cdb::target::strings)
         show_list(r, f);
@@ -296,23 +242,22 @@ void walker::show_place(const record_at &r, const cdb::field &f) {
 
 /* Where no list stands, a class was cut short, and the reference means nothing. */
 void walker::show_list(const record_at &r, const cdb::field &f) {
-    const list_kind &kind =
-        *std::find_if(std::begin(list_kinds), std::end(list_kinds), [&f](const list_kind &k) { return k.to == f.to; });
+    const cdb::list_kind &kind = cdb::list_kind_of(f.to);
     const cdb::bytes &lists = lists_of(r.tables, f.to);
     std::size_t at = r.area.number<std::uint32_t>(r.at + f.offset);
     if (at == CDB_NONE || lists.number<std::uint32_t>(at) != kind.id ||
         strays.contains(place_of(r.area) + r.at + f.offset))
         return out.add(same(f.name), none{});
-    record_at list = {format_of(kind.record), lists, at, r.tables};
+    record_at list = {*kind.head, lists, at, r.tables};
     open(list, f.name, std::string(f.name));
     show_fields(list);
     vx_data_type_t type = cdb::element_type(data_type_in(r.format, r.area, r.at));
-    record_at entry = {format_of(kind.entry), lists, at + list.format.size, r.tables, type};
+    record_at entry = {*kind.entry, lists, at + cdb::LIST_HEAD, r.tables, type};
     std::size_t count =
-        cdb::count_inside(lists, entry.at, lists.number<std::uint32_t>(at + LIST_COUNT), entry.format.size);
-    out.open_list({kind.entries_field, {}});
+        cdb::count_inside(lists, entry.at, lists.number<std::uint32_t>(at + cdb::LIST_COUNT), entry.format.size);
+    out.open_list({entries_of(*kind.head), {}});
     for (std::size_t i = 0; i < count; ++i, entry.at += entry.format.size)
-        show_record(entry, {}, kind.entry_title);
+        show_record(entry, {}, std::string(kind.title));
     out.close();
     out.close();
 }
@@ -322,14 +267,16 @@ void walker::show_list(const record_at &r, const cdb::field &f) {
 void walker::show_class_tables(const cdb::resource_class &rc) {
     const rsrc_class_t &record = rc.record();
     const cdb::bytes &section = rc.side_tables().section;
-    for (const class_table &table : class_tables) {
-        std::size_t at = (record.*table.place).offset[0];
-        record_at entry = {format_of(table.record), section, at, rc.side_tables()};
+    for (const cdb::side_table &table : cdb::side_tables) {
+        if (table.record == nullptr)
+            continue;
+        std::size_t at = (record.*table.ref).offset[0];
+        record_at entry = {*table.record, section, at, rc.side_tables()};
         /* At 0 stands the class: it is how a table says that it has no place. */
         std::size_t count = at == 0 ? 0 : cdb::count_inside(section, at, record.*table.count, entry.format.size);
         out.open_list({table.key, {}});
         for (std::size_t i = 0; i < count; ++i, entry.at += entry.format.size)
-            show_record(entry, {}, table.title);
+            show_record(entry, {}, std::string(table.title));
         out.close();
     }
 }
@@ -342,18 +289,18 @@ void walker::show_variables(const cdb::variable_class &vc) {
 }
 
 void walker::show_hash_blocks(const cdb::bytes &section) {
-    record_at block = {format_of("rc_hash_block_t"), section, offsetof(rsrc_class_hash_t, rc_hash_blocks), {}};
+    record_at block = {cdb::format_for<rc_hash_block_t>, section, offsetof(rsrc_class_hash_t, rc_hash_blocks), {}};
     auto told = section.number<std::uint32_t>(offsetof(rsrc_class_hash_t, rch_num_hash_blocks));
     std::size_t count = cdb::count_inside(section, block.at, told, block.format.size);
-    out.open_list({"rc_hash_blocks", {}});
+    out.open_list({entries_of(cdb::format_for<rsrc_class_hash_t>), {}});
     for (std::size_t i = 0; i < count; ++i, block.at += block.format.size)
         show_record(block, {}, "block");
     out.close();
 }
 
-void walker::show_root(std::size_t index, const section_kind &kind) {
-    record_at root = {format_of(kind.record), db.section(index), 0, tables_of(db, index)};
-    open(root, kind.key, kind.title);
+void walker::show_root(std::size_t index, const cdb::section_kind &kind) {
+    record_at root = {*kind.root, db.section(index), 0, tables_of(db, index)};
+    open(root, kind.key, std::string(kind.title));
     show_fields(root);
     if (kind.type == CDB_DSECT_CLASS)
         show_class_tables(cdb::resource_class(root.area));
@@ -367,10 +314,8 @@ void walker::show_root(std::size_t index, const section_kind &kind) {
 void walker::show_section(std::size_t index) {
     out.open({{}, "section"});
     std::size_t anchor_at = sizeof(orb_cdb_header_t) + index * sizeof(cdb_dsect_anchor_t);
-    show_fields({format_of("cdb_dsect_anchor_t"), db.file(), anchor_at, {}});
-    auto kind = std::find_if(std::begin(section_kinds), std::end(section_kinds),
-                             [&](const section_kind &k) { return k.type == db.anchor(index).cda_type; });
-    if (kind != std::end(section_kinds))
+    show_fields({cdb::format_for<cdb_dsect_anchor_t>, db.file(), anchor_at, {}});
+    if (const cdb::section_kind *kind = cdb::kind_of(db.anchor(index).cda_type))
         show_root(index, *kind);
     out.close();
 }
@@ -381,7 +326,7 @@ void walker::show_file() {
     out.open({{}, {}});
     out.add({"byte_order", "byte order"}, word{db.order() == std::endian::big ? "big-endian" : "little-endian"});
     out.add({"size", "size"}, std::uint64_t{db.file().size()});
-    show_record({format_of("orb_cdb_header_t"), db.file(), 0, {}}, "header", "header");
+    show_record({cdb::format_for<orb_cdb_header_t>, db.file(), 0, {}}, "header", "header");
     out.open_list({"sections", {}});
     for (std::size_t i = 0; i < db.section_count(); ++i)
         show_section(i);

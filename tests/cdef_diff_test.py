@@ -384,8 +384,8 @@ def test_sections_of_unused_types_pair_by_type(programs):
 
 
 # The last attribute of a class that another one cuts short seems to have the valid values of the first one, which are
-# numbers; read as texts all of them lead to its name.
-SAME_TEXT = """
+# numbers; read as texts all of them would lead to its name.
+NOT_ITS_VALUES = """
 include common.inc
 section class
 rsrc_class_t:1 $CLASS rc_locator=0 u_rc_pattrsC=224 u_rc_dattrsC=224 u_rc_pattrs=224 u_rc_dattrs=368
@@ -405,13 +405,56 @@ string "D"
 include tail.inc
 """
 
+# Expressions at 0, where the class's name stands: that is how one that was not given may look.
+SAME_TEXT = """
+include common.inc
+section class
+rsrc_class_t:1 $CLASS u_rc_pattrsC=224 u_rc_dattrsC=224 u_rc_pattrs=224 u_rc_dattrs=224
++ u_rc_actionsC={after} u_rc_actions={after} u_rc_variety_lists={after} u_rc_sd_defs={strings}
++ u_rc_valid_vals={strings} u_rc_strings={strings} rc_num_dattrs={count} rc_varlist_size={size}
+{attributes}
+{varieties}
+string "{name}"
+{names}
+include tail.inc
+"""
 
-def same_text(count, length):
-    """A database in which so many values lead to a text of so many characters; with its NUL it takes a multiple of 8."""
+
+def assembled(image):
+    """The database that an image describes, in this machine's byte order."""
+    return cdb_image.assemble(image, sys.byteorder, sys.byteorder, TESTS / "golden")
+
+
+def values_of_another(count, length):
+    """A database in which so many values of another attribute, read as texts, lead to so many characters."""
     size = 8 + 24 * count
     places = {"strings": 400 + size, "size": size, "second": 8 + length + 1}
-    text = SAME_TEXT.format(values=" UInt32:8,UInt32:8" * count, name="n" * length, **places)
-    return cdb_image.assemble(text, sys.byteorder, sys.byteorder, TESTS / "golden")
+    return assembled(NOT_ITS_VALUES.format(values=" UInt32:8,UInt32:8" * count, name="n" * length, **places))
+
+
+def same_text(count, length):
+    """A database in which so many attributes have the same text of so many characters; with its NUL it takes a
+    multiple of 8."""
+    numbers = range(count)
+    lines = {
+        "attributes": "".join(
+            f"rsrc_dattr_t:a $DATTR u_ra_name={length + 1 + 8 * i} u_ra_variety_list={16 * i} u_ra_express=0 "
+            "u_ra_rearm_expr=0\n" for i in numbers
+        ),
+        "varieties": "variety_list_t:g 0,1\n" * count,
+        "names": "".join(f'string "A{i}"\n' for i in numbers),
+    }
+    after = 224 + 136 * count
+    return assembled(
+        SAME_TEXT.format(count=count, after=after, size=16 * count, strings=after + 16 * count, name="n" * length,
+                         **lines)
+    )
+
+
+def test_values_of_another_are_not_told(programs):
+    """However many they are: nothing is out of proportion to the file."""
+    (programs.directory / "many.cdef").write_bytes(values_of_another(100, 32767))
+    same(programs.diff("many.cdef", "many.cdef"), (0, "", ""))
 
 
 def test_values_that_lead_to_one_text_too_often_are_refused(programs):

@@ -4,6 +4,7 @@
 #define CDGEN_CDEF_DIFF_H
 
 #include "cdb_view.h"
+#include "reader/ownership.h"
 
 #include <array>
 #include <optional>
@@ -52,10 +53,6 @@ constexpr cdb::level level_of(table t) {
                : cdb::level::of_resource;
 }
 
-/* The attributes that a following class cut short are the last of their tables. One without valid values refers to the
- * first list of them all the same, as if it were its own. By table, whether that is so. */
-std::array<bool, ATTRIBUTE_TABLES> without_valid_values(const cdb::resource_class &c, bool is_last_class);
-
 /* Thrown for a database made by hand whose references lead to the same texts or values so often that writing them all
  * would fill the memory. */
 struct too_entangled : std::runtime_error {
@@ -63,15 +60,7 @@ struct too_entangled : std::runtime_error {
 };
 
 /* Throws too_entangled. */
-thing meaning_of(const cdb::database &db);
-
-/* The offset of an out-of-line value at which no such value stands: of a Range that landed in the attribute of another
- * type. Nothing if a value does, or if the cell leads nowhere. */
-std::optional<std::uint32_t> misplaced(const cdb::value &value, const cdb::bytes &strings);
-
-/* The same of a dynamic attribute's bound, or of an element of one; wherever it leads if the type has no bounds. */
-enum class place_in : std::uint8_t { bound, array };
-std::optional<std::uint32_t> misplaced_bound(const cdb::value &value, const cdb::bytes &strings, place_in where);
+thing meaning_of(const cdb::database &db, const cdb::ownership &owners);
 
 /* Writes values as a person reads them: 5, 0.1, 'text', 0x0102, [1, 2], {Int32 0}, nothing, misplaced 5.
  *
@@ -84,7 +73,9 @@ public:
     /* strings: of the value's class. */
     std::string text_of(const cdb::value &value, const cdb::bytes &strings);
     std::string text_of(std::string_view text);
-    std::string text_of_bound(const cdb::value &value, const cdb::bytes &strings, place_in where = place_in::bound);
+    /* is_own: the bound is the attribute's own. */
+    std::string text_of_bound(const cdb::value &bound, bool is_own, const cdb::bytes &strings,
+                              const cdb::ownership &owners);
 
 private:
     void spend(std::size_t amount);

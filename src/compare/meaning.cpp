@@ -27,7 +27,8 @@ constexpr record_kind kinds[RECORD_TABLES] = {
 
 class builder {
 public:
-    explicit builder(const cdb::database &database) : db(database), tell(database.file().size()) {}
+    builder(const cdb::database &database, const cdb::ownership &ownership)
+        : db(database), owners(ownership), tell(database.file().size()) {}
 
     thing whole();
 
@@ -38,7 +39,7 @@ private:
     void add_text(thing &to, const cdb::field &f, std::string_view text);
     void add_reference(thing &to, const cdb::field &f, const cdb_ref_t &ref, const cdb::class_tables &tables,
                        vx_data_type_t type);
-    void add_value(thing &to, const cdb::field &f, const cdb::value &value, const cdb::bytes &strings);
+    void add_value(thing &to, const cdb::field &f, const cdb::value &value, bool is_own, const cdb::bytes &strings);
     void add_varieties(thing &to, const cdb::variety_list &varieties);
     void add_valid_values(thing &to, const cdb::valid_value_list &values, const cdb::class_tables &tables);
     void add_elements(thing &to, const cdb::field &f, const cdb_ref_t &ref, const cdb::class_tables &tables);
@@ -46,13 +47,13 @@ private:
     void add_records(thing &to, table from, const cdb::class_tables &tables, const cdb_ref_t &first, std::size_t count);
     void add_errors(thing &to, const rsrc_class_t &rc, const cdb::class_tables &tables);
     void add_dependencies(thing &to, const rsrc_class_t &rc, const cdb::bytes &section);
-    thing resource_class(const cdb::bytes &section, bool is_last);
+    thing resource_class(const cdb::bytes &section);
     thing class_hash(const cdb::bytes &section);
     thing variable_class(const cdb::bytes &section);
     thing section(std::size_t index);
-    std::size_t last_class() const;
 
     const cdb::database &db;
+    const cdb::ownership &owners;
     teller tell;
 };
 
@@ -70,9 +71,10 @@ void builder::add_text(thing &to, const cdb::field &f, std::string_view text) {
         to.facts.push_back({f.name, label_of(f).words, text.empty() ? "nothing" : tell.text_of(text)});
 }
 
-void builder::add_value(thing &to, const cdb::field &f, const cdb::value &value, const cdb::bytes &strings) {
+void builder::add_value(thing &to, const cdb::field &f, const cdb::value &value, bool is_own,
+                        const cdb::bytes &strings) {
     bool bound = f.name == "ra_min_value" || f.name == "ra_max_value";
-    std::string text = bound ? tell.text_of_bound(value, strings) : tell.text_of(value, strings);
+    std::string text = bound ? tell.text_of_bound(value, is_own, strings, owners) : tell.text_of(value, strings);
     to.facts.push_back({f.name, label_of(f).words, std::move(text)});
 }
 
@@ -146,14 +148,15 @@ thing builder::record(const record_kind &kind, const cdb::bytes &area, std::size
     thing made = {std::string(kind.name), {}, {}, {}};
     for (const cdb::field &f : cdb::fields_of<Record>) {
         const std::byte *from = bytes + f.offset;
-        if (is_layout(f.name))
+        bool is_own = owners.is_own(area, at + f.offset);
+        if (is_layout(f.name) || (f.to == cdb::target::valid_vals && !is_own))
             continue;
         if (f.kind == cdb::field_kind::number)
             add_number(made, kind, f, f.width == 2 ? load<std::uint16_t>(from) : load<std::uint32_t>(from));
         else if (f.kind == cdb::field_kind::reference)
             add_reference(made, f, load<cdb_ref_t>(from), tables, type);
         else if (f.kind == cdb::field_kind::value)
-            add_value(made, f, {area, at + f.offset, type, tables.strings}, tables.strings);
+            add_value(made, f, {area, at + f.offset, type, tables.strings}, is_own, tables.strings);
     }
     return made;
 }
@@ -204,14 +207,7 @@ thing builder::class_hash(const cdb::bytes &section) {
     return made;
 }
 
-/* What seems to be the valid values of the last attribute of a table. */
-void drop_valid_values(thing &of_class, std::string_view kind) {
-    auto last =
-        std::find_if(of_class.parts.rbegin(), of_class.parts.rend(), [&](const thing &t) { return t.kind == kind; });
-    std::erase_if(last->parts, [](const thing &part) { return part.kind == VALID_VALUE; });
-}
-
-thing builder::resource_class(const cdb::bytes &section, bool is_last) {
+thing builder::resource_class(const cdb::bytes &section) {
     cdb::resource_class view(section);
     const rsrc_class_t &rc = view.record();
     const cdb::class_tables &tables = view.side_tables();
@@ -224,10 +220,6 @@ thing builder::resource_class(const cdb::bytes &section, bool is_last) {
     add_records<rsrc_action_t>(made, table::class_actions, tables, rc.u_rc_actionsC, rc.rc_num_actionsC);
     add_errors(made, rc, tables);
     add_dependencies(made, rc, tables.section);
-    std::array<bool, ATTRIBUTE_TABLES> without = without_valid_values(view, is_last);
-    for (std::size_t t = 0; t < without.size(); ++t)
-        if (without[t])
-            drop_valid_values(made, kinds[t].name);
     return made;
 }
 
@@ -250,7 +242,7 @@ thing builder::section(std::size_t index) {
     cdb::class_tables tables;
     switch (type) {
     case CDB_DSECT_CLASS:
-        return resource_class(bytes, index == last_class());
+        return resource_class(bytes);
     case CDB_DSECT_VAR_CLASS:
         return variable_class(bytes);
     case CDB_DSECT_RSRC_MGR:
@@ -269,13 +261,6 @@ thing builder::section(std::size_t index) {
     return {"section of type " + std::to_string(type), {}, {}, {}};
 }
 
-std::size_t builder::last_class() const {
-    std::size_t last = db.section_count();
-    while (last > 0 && db.anchor(last - 1).cda_type != CDB_DSECT_CLASS)
-        --last;
-    return last - 1;
-}
-
 thing builder::whole() {
     thing made = record<orb_cdb_header_t>({"database", {}}, db.file(), 0, {});
     for (std::size_t i = 0; i < db.section_count(); ++i) {
@@ -287,8 +272,8 @@ thing builder::whole() {
 
 } // namespace
 
-thing meaning_of(const cdb::database &db) {
-    return builder(db).whole();
+thing meaning_of(const cdb::database &db, const cdb::ownership &owners) {
+    return builder(db, owners).whole();
 }
 
 } // namespace cdef

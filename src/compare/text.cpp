@@ -14,14 +14,7 @@ namespace {
 constexpr std::size_t TIMES_FILE = 16;
 constexpr std::size_t AT_LEAST = 1 << 20;
 
-std::string text_of_handle(const vx_resource_handle_t &handle) {
-    std::string text;
-    text::appendf(text, "%x:%x:%x:%x:%x", handle.header, handle.id.id1, handle.id.id2, handle.id.id3, handle.id.id4);
-    return text;
-}
-
-} // namespace
-
+/* The offset of an out-of-line value that leads to no such value; nothing if it does, or leads nowhere. */
 std::optional<std::uint32_t> misplaced(const cdb::value &value, const cdb::bytes &strings) {
     constexpr std::size_t ALIGNMENT = 8;
     std::optional<std::uint32_t> place = value.place();
@@ -38,11 +31,13 @@ std::optional<std::uint32_t> misplaced(const cdb::value &value, const cdb::bytes
     return right ? std::nullopt : place;
 }
 
-std::optional<std::uint32_t> misplaced_bound(const cdb::value &value, const cdb::bytes &strings, place_in where) {
-    vx_data_type_t type = value.type();
-    bool has_bounds = type == VX_RSRC_HANDLE_PTR || type == VX_SD_PTR ? where == place_in::array : cdb::is_array(type);
-    return has_bounds ? misplaced(value, strings) : value.place();
+std::string text_of_handle(const vx_resource_handle_t &handle) {
+    std::string text;
+    text::appendf(text, "%x:%x:%x:%x:%x", handle.header, handle.id.id1, handle.id.id2, handle.id.id3, handle.id.id4);
+    return text;
 }
+
+} // namespace
 
 teller::teller(std::size_t file_size) : left(file_size * TIMES_FILE + AT_LEAST) {}
 
@@ -99,15 +94,20 @@ std::string teller::text_of(const cdb::value &value, const cdb::bytes &strings) 
     }
 }
 
-/* Of the types without bounds only an array has something all the same, to which elements belong. */
-std::string teller::text_of_bound(const cdb::value &value, const cdb::bytes &strings, place_in where) {
-    if (std::optional<std::uint32_t> offset = misplaced_bound(value, strings, where))
-        return "misplaced " + std::to_string(*offset);
-    if (!cdb::is_array(value.type()) || !value.present())
-        return text_of(value, strings);
+/* What is not the attribute's own is a number of another type. */
+std::string teller::text_of_bound(const cdb::value &bound, bool is_own, const cdb::bytes &strings,
+                                  const cdb::ownership &owners) {
+    if (!is_own && bound.place())
+        return "misplaced " + std::to_string(*bound.place());
+    if (!cdb::is_array(bound.type()) || !bound.present())
+        return text_of(bound, strings);
     std::string text;
-    for (const cdb::value &element : value.elements())
-        text += (text.empty() ? "" : ", ") + text_of_bound(element, strings, place_in::array);
+    std::size_t cell = *bound.place() + cdb::value::ELEMENTS;
+    for (const cdb::value &element : bound.elements()) {
+        text += text.empty() ? "" : ", ";
+        text += text_of_bound(element, owners.is_own(strings, cell), strings, owners);
+        cell += sizeof(vx_value_t);
+    }
     return "[" + text + "]";
 }
 

@@ -99,6 +99,7 @@ void class_walk::follow_reference(const spot &place, const field &f, std::uint32
     case target::variety_lists:
         return walk_varieties(place, f, word);
     case target::valid_vals:
+        evidence.has_owner = evidence.has_owner || word == 0;
         return walk_valid_values(place, f, word, type);
     case target::sd_defs:
         return walk_sd_definition(place, f, word);
@@ -130,37 +131,63 @@ static bool is_bound(const field &f) {
            (f.offset == offsetof(rsrc_dattr_t, ra_min_value) || f.offset == offsetof(rsrc_dattr_t, ra_max_value));
 }
 
-/* What a new class found open went into the old one as it was: the last record of a table, in a class that is not the
- * last. Its reference to valid values may be 0 and mean nothing. Likewise a resource attribute's range may have come
- * from a class attribute's stanza, and be of its type. */
+/* An attribute that a following class cut short is the last of its table, in a class that is not the last. Its
+ * reference to valid values may be 0 and mean nothing; only a persistent class attribute says "none" from the start.
+ * The bounds of a resource attribute may be the range of a class attribute, and of its type. */
 template <class Record>
 void class_walk::follow_attribute(const spot &place, std::size_t offset, vx_uint32_t id, bool last) {
-    auto type = section.number<vx_data_type_t>(offset + offsetof(Record, ra_data_type));
+    auto record = section.record<Record>(offset);
+    vx_data_type_t type = record.ra_data_type;
     bool may_be_cut_short = last && !is_last;
     walk.may_be_unset = may_be_cut_short;
+    bool may_have_no_list = may_be_cut_short && id != CDB_ID_PATTR_C;
     bool may_be_astray = id == CDB_ID_DATTR && is_out_of_line(type);
     for (const field &f : leading_fields_of<Record>) {
         auto word = section.number<std::uint32_t>(offset + f.offset);
-        if (may_be_cut_short && f.to == target::valid_vals && word == 0)
-            doubtful_lists.push_back({place, &f, word, type});
+        if (may_have_no_list && f.to == target::valid_vals && word == 0)
+            doubtful_lists.push_back({place, &f, type, record.u_ra_variety_list, record.u_ra_name.offset[0]});
         else if (may_be_astray && is_bound(f))
             doubtful_bounds.push_back({place, &f, word, type});
         else
             follow_field(place, f, word, type);
+        if (f.to == target::valid_vals && word != 0 && word != CDB_NONE)
+            evidence.later_list = std::min(evidence.later_list, record.u_ra_variety_list.offset[0]);
     }
 }
 
+/* The attribute, among those in doubt, that has the first list of valid values. */
+std::optional<std::size_t> class_walk::owner_of_doubtful_lists() const {
+    if (valid_vals.area.number<vx_uint32_t>(0) != CDB_ID_VALID_VALUES)
+        return std::nullopt;
+    std::vector<suspect> suspects;
+    for (const doubtful_list &d : doubtful_lists) {
+        valid_value_list list = valid_values_at(tables(), {}, d.type);
+        bool is_complete = d.type != VX_UNKNOWN && !varieties_at(tables(), d.variety_list).empty();
+        suspects.push_back(
+            {can_have_list(list, strings.area, is_complete), d.variety_list.offset[0], d.name, first_text(list)});
+    }
+    return owner_of_first_list(suspects, evidence);
+}
+
 void class_walk::walk_doubtful_lists() {
+    std::optional<std::size_t> owner = owner_of_doubtful_lists();
+    bool is_there = valid_vals.area.holds(0, LIST_HEAD);
     walk.excuse = check::CUT_SHORT;
-    for (const doubtful &d : doubtful_lists)
-        walk_valid_values(d.record_at, *d.what, d.word, d.type);
+    for (std::size_t i = 0; i < doubtful_lists.size(); ++i) {
+        const doubtful_list &d = doubtful_lists[i];
+        if (i == owner)
+            walk_valid_values(d.record_at, *d.what, 0, d.type);
+        else
+            walk.report(check::CUT_SHORT, d.record_at, d.what->name, d.record_at.offset + d.what->offset, "0",
+                        is_there ? "a list of its own" : "in " + std::to_string(valid_vals.area.size()) + " bytes");
+    }
     walk.excuse.reset();
 }
 
 /* Only arrays have bounds that are out of line. */
 void class_walk::walk_doubtful_bounds() {
     walk.excuse = check::RANGE_ASTRAY;
-    for (const doubtful &d : doubtful_bounds) {
+    for (const doubtful_bound &d : doubtful_bounds) {
         std::size_t file_offset = d.record_at.offset + d.what->offset;
         if (is_array(d.type) || d.word == 0)
             walk_container(d.record_at, d.what->name, file_offset, d.word, d.type);
@@ -200,8 +227,7 @@ void class_walk::walk_attributes(const cdb_ref_t &ref, std::size_t count, std::s
 /* A run of element stanzas gives an attribute its definition, its largest index and its value; one that ends the source
  * comes too late for the last two. */
 template <class Record> void class_walk::check_structure(const spot &place, const Record &record) {
-    class_tables tables = {section, strings.area, valid_vals.area, variety_lists.area, sd_defs.area};
-    sd_definition definition = sd_definition_at(tables, record.u_ra_sd);
+    sd_definition definition = sd_definition_at(tables(), record.u_ra_sd);
     bool absent = record.u_ra_sd.offset[0] == CDB_NONE;
     std::size_t elements = std::size_t{record.ra_max_sd_idx} + 1;
     if (absent || elements != definition.size())
@@ -209,7 +235,7 @@ template <class Record> void class_walk::check_structure(const spot &place, cons
                     place.offset + (absent ? offsetof(Record, u_ra_sd) : offsetof(Record, ra_max_sd_idx)),
                     absent ? "none" : std::to_string(record.ra_max_sd_idx),
                     absent ? "a definition" : std::to_string(definition.size()) + " elements");
-    attribute<Record> attr(tables, place.offset - at.offset);
+    attribute<Record> attr(tables(), place.offset - at.offset);
     if constexpr (std::is_same_v<Record, rsrc_pattr_t>)
         check_structure_value(place, *field_at(pattr_fields, offsetof(rsrc_pattr_t, ra_dflt_value)), definition,
                               attr.default_value());

@@ -3,6 +3,7 @@
 #ifndef CDGEN_CDB_WALK_CLASS_H
 #define CDGEN_CDB_WALK_CLASS_H
 
+#include "reader/ownership.h"
 #include "reader/walk.h"
 
 namespace cdb {
@@ -28,8 +29,18 @@ public:
     void run();
 
 private:
-    /* A reference that may be meaningless: it has to wait until the genuine owners have claimed what is theirs. */
-    struct doubtful {
+    /* A reference to the first list of valid values that may mean that there is none: it is decided once all other
+     * references are known. */
+    struct doubtful_list {
+        spot record_at;
+        const field *what;
+        vx_data_type_t type;    /* the attribute's */
+        cdb_ref_t variety_list; /* the attribute's */
+        std::uint32_t name;     /* offset in the strings */
+    };
+
+    /* A bound that may be a number of another type: it is followed once all genuine values have claimed their bytes. */
+    struct doubtful_bound {
         spot record_at;
         const field *what;
         std::uint32_t word;
@@ -38,6 +49,10 @@ private:
 
     extent table(const cdb_ref_t &ref, std::size_t size) const {
         return {section.part(ref.offset[0], size), at.offset + ref.offset[0]};
+    }
+
+    class_tables tables() const {
+        return {section, strings.area, valid_vals.area, variety_lists.area, sd_defs.area};
     }
 
     void check_tables();
@@ -50,6 +65,7 @@ private:
     void walk_errors();
     void walk_depends();
     template <class Record> void follow_attribute(const spot &place, std::size_t offset, vx_uint32_t id, bool last);
+    std::optional<std::size_t> owner_of_doubtful_lists() const;
     void walk_doubtful_lists();
     void walk_doubtful_bounds();
 
@@ -73,6 +89,7 @@ private:
     void walk_handle(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset);
     void walk_array(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset,
                     vx_data_type_t type);
+    void expect_no_bound(const spot &cell);
     void walk_structured_data(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset);
     void walk_filling(const spot &place, std::size_t end);
     void report_unreached(extent &lists, std::string_view name);
@@ -89,8 +106,9 @@ private:
     unsigned nesting = 0;
     bool met_shared = false;                 /* the attribute being walked led to a list or a value of another owner */
     std::vector<std::size_t> empty_binaries; /* ends of their lengths' pieces, in the strings */
-    std::vector<doubtful> doubtful_lists;
-    std::vector<doubtful> doubtful_bounds;
+    first_list_evidence evidence;
+    std::vector<doubtful_list> doubtful_lists;
+    std::vector<doubtful_bound> doubtful_bounds;
 };
 
 } // namespace cdb

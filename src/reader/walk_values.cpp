@@ -95,6 +95,13 @@ void class_walk::walk_handle(const spot &place, std::string_view field, std::siz
     walk_filling(handle, offset + SIZE);
 }
 
+/* Texts and binaries have no bounds, in an array either; the compiler writes none or never fills the cell. */
+void class_walk::expect_no_bound(const spot &cell) {
+    auto word = strings.area.number<std::uint32_t>(cell.offset - strings.offset);
+    if (word != CDB_NONE && word != 0)
+        walk.report(check::RANGE_ASTRAY, cell, "elements", cell.offset, std::to_string(word), "none");
+}
+
 void class_walk::walk_array(const spot &place, std::string_view field, std::size_t file_offset, std::size_t offset,
                             vx_data_type_t type) {
     std::size_t count = strings.area.number<std::uint32_t>(offset);
@@ -106,7 +113,9 @@ void class_walk::walk_array(const spot &place, std::string_view field, std::size
     spot cell = {at.section, "vx_value_t", 0, array.offset + value::ELEMENTS};
     for (; cell.index < count; ++cell.index, cell.offset += sizeof(vx_value_t)) {
         walk.add_region(cell, cell.offset, sizeof(vx_value_t), cell.record);
-        if (is_out_of_line(element))
+        if (walk.excuse == check::RANGE_ASTRAY && (element == VX_CHAR_PTR || element == VX_BINARY_PTR))
+            expect_no_bound(cell);
+        else if (is_out_of_line(element))
             walk_container(cell, "elements", cell.offset,
                            strings.area.number<std::uint32_t>(cell.offset - strings.offset), element);
     }

@@ -81,9 +81,9 @@ json json_of(const difference &d) {
 
 thing read(const std::string &path, std::unique_ptr<input> &in) {
     in = std::make_unique<input>(path);
-    require_readable_aloud(*in);
+    cdb::ownership owners(in->db, require_readable_aloud(*in));
     try {
-        return meaning_of(in->db);
+        return meaning_of(in->db, owners);
     } catch (const too_entangled &t) {
         throw trouble(path + ": " + t.what());
     }

@@ -1,12 +1,12 @@
 /* walk.cpp: the walk over the facts of a database, in the order of the file. Each form takes them as it likes. */
 
 #include "cdef/dump/dump.h"
+#include "reader/ownership.h"
 
 #include "format/sections.h"
 #include "text/shown.h"
 
 #include <unordered_map>
-#include <unordered_set>
 
 namespace cdef::dump {
 
@@ -30,7 +30,12 @@ named found_in(const named_by_number &known, std::uint32_t number) {
 
 class walker {
 public:
-    walker(const cdb::database &walked, sink &to, bool offsets) : db(walked), out(to), with_offsets(offsets) {}
+    walker(const cdb::database &walked, const std::vector<cdb::finding> &findings, sink &to, bool offsets)
+        : db(walked), out(to), with_offsets(offsets), owners(walked, findings) {
+        for (const cdb::finding &f : findings)
+            if (f.broken->code == cdb::CODE_CHECKSUM)
+                sum = {f.found, f.expected};
+    }
 
     void show_file();
 
@@ -53,14 +58,13 @@ private:
 
     named locator(const cdb::class_tables &tables, std::uint32_t number) const;
     void collect_named();
-    void collect_findings();
     std::size_t place_of(const cdb::bytes &area) const;
 
     const cdb::database &db;
     sink &out;
     bool with_offsets;
     checksum sum;
-    std::unordered_set<std::size_t> strays; /* where references and cells stand that mean nothing */
+    cdb::ownership owners;
     /* Of several with one number, the first. */
     named_by_number variables; /* dynamic attributes, by variable ID */
     named_by_number managers;
@@ -101,17 +105,6 @@ void walker::collect_named() {
         managers.try_emplace(m.record().rm_id, named{m.record().rm_id, "manager", m.name()});
 }
 
-/* The compiler can leave an attribute references to another's valid values, and a range of another type; the verifier
- * tells which. Whatever they lead to is not the attribute's, and may be there for others many times over. */
-void walker::collect_findings() {
-    for (const cdb::finding &f : cdb::verify(db)) {
-        if (f.broken->code == cdb::CODE_CHECKSUM)
-            sum = {f.found, f.expected};
-        if (f.broken->code == cdb::CODE_CUT_SHORT || f.broken->code == cdb::CODE_RANGE_ASTRAY)
-            strays.insert(f.offset);
-    }
-}
-
 /* Of an area in the file. */
 std::size_t walker::place_of(const cdb::bytes &area) const {
     return area.size() == 0 ? 0 : static_cast<std::size_t>(area.raw().data() - db.file().raw().data());
@@ -133,7 +126,7 @@ void walker::show_element(vx_data_type_t container, const cdb::value &element, s
 /* cell, strings: where in the file the value's cell is, and the strings that it may lead into. */
 void walker::show_value(const label &what, const cdb::value &value, std::size_t cell, std::size_t strings) {
     bool holds_elements = value.type() == VX_SD_PTR || cdb::is_array(value.type());
-    if (strays.contains(cell))
+    if (!owners.is_own(cell))
         return out.add(what, none{});
     if (!holds_elements || !value.present())
         return out.add(what, fact_of(value));
@@ -240,13 +233,12 @@ void walker::show_place(const record_at &r, const cdb::field &f) {
     out.close();
 }
 
-/* Where no list stands, a class was cut short, and the reference means nothing. */
+/* What another record owns, or nobody, may be there for many; it is shown with its owner only. */
 void walker::show_list(const record_at &r, const cdb::field &f) {
     const cdb::list_kind &kind = cdb::list_kind_of(f.to);
     const cdb::bytes &lists = lists_of(r.tables, f.to);
     std::size_t at = r.area.number<std::uint32_t>(r.at + f.offset);
-    if (at == CDB_NONE || lists.number<std::uint32_t>(at) != kind.id ||
-        strays.contains(place_of(r.area) + r.at + f.offset))
+    if (at == CDB_NONE || lists.number<std::uint32_t>(at) != kind.id || !owners.is_own(r.area, r.at + f.offset))
         return out.add(same(f.name), none{});
     record_at list = {*kind.head, lists, at, r.tables};
     open(list, f.name, std::string(f.name));
@@ -321,7 +313,6 @@ void walker::show_section(std::size_t index) {
 }
 
 void walker::show_file() {
-    collect_findings();
     collect_named();
     out.open({{}, {}});
     out.add({"byte_order", "byte order"}, word{db.order() == std::endian::big ? "big-endian" : "little-endian"});
@@ -337,7 +328,7 @@ void walker::show_file() {
 } // namespace
 
 void walk(const cdb::database &db, sink &to, bool with_offsets) {
-    walker(db, to, with_offsets).show_file();
+    walker(db, cdb::verify(db), to, with_offsets).show_file();
 }
 
 } // namespace cdef::dump

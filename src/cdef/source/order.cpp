@@ -122,6 +122,16 @@ std::size_t class_plan::count(table of_records) const {
     return view.record().*counts[static_cast<std::size_t>(of_records)];
 }
 
+bool class_plan::owns(const step &attribute, std::size_t field_offset) const {
+    constexpr cdb_ref_t rsrc_class_t::*tables[ATTRIBUTE_TABLES] = {
+        &rsrc_class_t::u_rc_pattrsC, &rsrc_class_t::u_rc_dattrsC, &rsrc_class_t::u_rc_pattrs,
+        &rsrc_class_t::u_rc_dattrs};
+    bool is_dynamic = attribute.from == table::dynamic_class_attributes || attribute.from == table::dynamic_attributes;
+    std::size_t first = (view.record().*tables[static_cast<std::size_t>(attribute.from)]).offset[0];
+    std::size_t size = is_dynamic ? sizeof(rsrc_dattr_t) : sizeof(rsrc_pattr_t);
+    return owners->is_own(view.side_tables().section, first + attribute.index * size + field_offset);
+}
+
 void plan_order(class_plan &plan) {
     std::vector<step> inputs = inputs_in_order(plan);
     auto next = inputs.begin();

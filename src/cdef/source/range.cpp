@@ -99,9 +99,16 @@ template <class Number> cell cell_of(Number number) {
     return made;
 }
 
-/* A number's bytes, or those of the place that a reference leads to where no value stands: of a number that landed in
- * the attribute of another type. Nothing for a value in its place. */
-std::optional<cell> bytes_of(const cdb::value &v, const cdb::bytes &strings, place_in where) {
+/* A bound, or an element of one that is an array. */
+struct bound {
+    cdb::value value;
+    bool is_own;
+};
+
+/* A number's bytes, or those of the place that a reference leads to where no value of its own is stored: of a number
+ * that landed in the attribute of another type. Nothing for a value of its own. */
+std::optional<cell> bytes_of(const bound &b) {
+    const cdb::value &v = b.value;
     switch (v.type()) {
     case VX_INT32:
     case VX_INT64:
@@ -116,21 +123,35 @@ std::optional<cell> bytes_of(const cdb::value &v, const cdb::bytes &strings, pla
     default:
         break;
     }
-    if (!cdb::is_out_of_line(v.type()))
+    if (!cdb::is_out_of_line(v.type()) || (v.present() && b.is_own))
         return std::nullopt;
-    std::optional<std::uint32_t> place = v.present() ? misplaced_bound(v, strings, where) : 0;
-    return place ? std::optional(cell_of(*place)) : std::nullopt;
+    return cell_of(v.place().value_or(0));
 }
 
-wanted_bytes wanted_of(const cdb::value &low, const cdb::value &high, const cdb::bytes &strings,
-                       place_in where = place_in::bound) {
-    std::optional<cell> first = bytes_of(low, strings, where), second = bytes_of(high, strings, where);
-    if (first && second)
-        return {.known = true, .in_arrays = false, .width = width_of(low.type()), .low = *first, .high = *second};
-    std::optional<cdb::value> low_element = only_element(low), high_element = only_element(high);
-    if (!low_element || !high_element || !cdb::is_array(low.type()))
+std::optional<wanted_bytes> wanted_in_cells(const bound &low, const bound &high) {
+    std::optional<cell> first = bytes_of(low), second = bytes_of(high);
+    if (!first || !second)
+        return std::nullopt;
+    return wanted_bytes{
+        .known = true, .in_arrays = false, .width = width_of(low.value.type()), .low = *first, .high = *second};
+}
+
+/* The one element of a bound that is an array; nothing if it has not exactly one. */
+std::optional<bound> element_of(const bound &array, const class_plan &plan) {
+    std::optional<cdb::value> element = only_element(array.value);
+    if (!element || !cdb::is_array(array.value.type()))
+        return std::nullopt;
+    std::size_t place = *array.value.place() + cdb::value::ELEMENTS;
+    return bound{*element, plan.owners->is_own(plan.view.side_tables().strings, place)};
+}
+
+wanted_bytes wanted_of(const bound &low, const bound &high, const class_plan &plan) {
+    if (std::optional<wanted_bytes> wanted = wanted_in_cells(low, high))
+        return *wanted;
+    std::optional<bound> first = element_of(low, plan), second = element_of(high, plan);
+    if (!first || !second)
         return {};
-    wanted_bytes wanted = wanted_of(*low_element, *high_element, strings, place_in::array);
+    wanted_bytes wanted = wanted_in_cells(*first, *second).value_or(wanted_bytes());
     wanted.in_arrays = true;
     return wanted;
 }
@@ -138,13 +159,15 @@ wanted_bytes wanted_of(const cdb::value &low, const cdb::value &high, const cdb:
 range range_of(const class_plan &plan, const step &s) {
     cdb::dynamic_attribute attr = plan.view.dynamic_attributes(level_of(s.from))[s.index];
     cdb::value low = attr.min_value(), high = attr.max_value();
+    bound first = {low, plan.owns(s, offsetof(rsrc_dattr_t, ra_min_value))};
+    bound second = {high, plan.owns(s, offsetof(rsrc_dattr_t, ra_max_value))};
     bool array = cdb::is_array(attr.type());
     return {.type = attr.type(),
             .takes_line = is_number(cdb::element_type(attr.type())) && is_complete(attr),
             .is_default = are_default(low, high),
             .is_untouched = are_untouched(low, high),
             .has_none = !is_number(attr.type()) && !array && !low.present() && !high.present(),
-            .wanted = wanted_of(low, high, plan.view.side_tables().strings)};
+            .wanted = wanted_of(first, second, plan)};
 }
 
 /* The value of a Range line of one type that leaves another attribute's bytes; empty if there is none. */

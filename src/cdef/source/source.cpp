@@ -149,10 +149,10 @@ void write_map(source_writer &out, const cdb::database &db) {
 
 /* ---- The whole ------------------------------------------------------------------------------------------------- */
 
-std::vector<class_plan> plans_of(const cdb::database &db) {
+std::vector<class_plan> plans_of(const cdb::database &db, const cdb::ownership &owners) {
     std::vector<class_plan> plans;
     for (const cdb::resource_class &c : db.classes())
-        plans.emplace_back(c, false);
+        plans.emplace_back(c, owners);
     plans.back().is_last = true;
     for (class_plan &plan : plans) {
         plan_order(plan);
@@ -182,9 +182,9 @@ void write_heading(source_writer &out, const std::vector<class_plan> &plans) {
                                     text::quoted_ascii(*output + std::string(SUFFIX)) + ".");
 }
 
-std::string source_of(const cdb::database &db) {
+std::string source_of(const cdb::database &db, const cdb::ownership &owners) {
     require_settable(db);
-    std::vector<class_plan> plans = plans_of(db);
+    std::vector<class_plan> plans = plans_of(db, owners);
     bool map_first = plans.back().ends_in_run;
     source_writer out;
     write_heading(out, plans);
@@ -217,10 +217,10 @@ bool is_harmless(std::string_view text) {
 
 int source(const std::string &path) {
     input in(path);
-    require_readable_aloud(in);
+    cdb::ownership owners(in.db, require_readable_aloud(in));
     std::string text;
     try {
-        text = source_of(in.db);
+        text = source_of(in.db, owners);
     } catch (const trouble &t) {
         throw trouble(path + ": " + t.what());
     }

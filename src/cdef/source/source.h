@@ -82,10 +82,11 @@ struct dynamic_plan {
 };
 
 struct class_plan {
-    class_plan(const cdb::resource_class &of, bool last) : view(of), is_last(last) {}
+    class_plan(const cdb::resource_class &of, const cdb::ownership &ownership) : view(of), owners(&ownership) {}
 
     cdb::resource_class view;
-    bool is_last;
+    const cdb::ownership *owners;
+    bool is_last = false;
     std::vector<step> order;
     bool ends_in_run = false;                         /* the last step's run of SD stanzas ends the file */
     std::array<std::vector<dynamic_plan>, 2> dynamic; /* by level */
@@ -97,6 +98,8 @@ struct class_plan {
         return dynamic[static_cast<std::size_t>(level)];
     }
     std::size_t count(table of_records) const;
+    /* Whether a field of an attribute leads to what is the attribute's own. */
+    bool owns(const step &attribute, std::size_t field_offset) const;
     /* A class that follows in the source ends this one while the last attribute of each kind is still open: it is
      * written as it is, without the checks and defaults of its completion. */
     bool is_cut_short(const step &s) const {

@@ -89,9 +89,7 @@ private:
     }
 
     cdb::valid_value_list own_valid_values() const {
-        bool has_none =
-            plan.is_cut_short(at) && without_valid_values(plan.view, plan.is_last)[static_cast<std::size_t>(at.from)];
-        return has_none ? cdb::valid_value_list() : attr.valid_values();
+        return plan.owns(at, offsetof(Record, u_ra_valid_vals)) ? attr.valid_values() : cdb::valid_value_list();
     }
 
     void write_required() {

@@ -27,7 +27,7 @@ std::vector<cdb::finding> require_readable(const input &in);
 
 /* The same, and reports on standard error which of these two errors it has, each once: for subcommands whose output
  * does not show it. */
-void require_readable_aloud(const input &in);
+std::vector<cdb::finding> require_readable_aloud(const input &in);
 
 } // namespace cdef
 

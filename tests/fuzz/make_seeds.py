@@ -14,7 +14,7 @@ import subprocess
 import sys
 
 TESTS = pathlib.Path(__file__).resolve().parent.parent
-sys.path.insert(0, str(TESTS))
+sys.path.insert(0, str(TESTS / "support"))
 
 import generate_sources  # noqa: E402
 
@@ -102,7 +102,7 @@ def main():
         option = OPTIONS[number % len(OPTIONS)]
         (options.directory / "source" / str(number)).write_bytes(bytes([option]) + text)
         compile_source(options.cdgen.resolve(), options.directory / "image", text, number)
-    command = [sys.executable, "-B", TESTS / "image" / "make_images.py", "--out", options.directory / "image"]
+    command = [sys.executable, "-B", TESTS / "support" / "make_images.py", "--out", options.directory / "image"]
     subprocess.run(command, check=True)
     write_cdef_seeds(options.directory)
     dictionary = sorted({escaped(word) for word in words(options.list_names.resolve())})

@@ -4,13 +4,10 @@ import os
 import pathlib
 import shutil
 import subprocess
-import sys
 import tempfile
 import unittest
 
 from installed import BUILD, PROJECT, Case, run
-
-sys.path.insert(0, str(PROJECT / "tests"))
 from documents import broken_links
 
 

@@ -5,12 +5,9 @@ import os
 import pathlib
 import re
 import shlex
-import sys
 import unittest
 
 from installed import BUILD, PROJECT, Case, documents, examples, only, pkg_config_environment, program, run, tree
-
-sys.path.insert(0, str(PROJECT / "tests"))
 from documents import broken_links, text_of
 
 

@@ -1,4 +1,4 @@
-/* image_files.h: the images that tests/image/make_images.py makes, in memory. */
+/* image_files.h: the images that tests/support/make_images.py makes, in memory. */
 #ifndef CDGEN_IMAGE_FILES_H
 #define CDGEN_IMAGE_FILES_H
 

@@ -1,5 +1,5 @@
 /* Who has the first list of valid values of a class, as far as records alone decide. Whole databases:
- * cdef_owners_test.py. */
+ * cdef/owners_test.py. */
 
 #include "reader/ownership.h"
 

@@ -1,6 +1,6 @@
 """Test how `cdef check` is used: many sources, ones that cannot be read, standard
 input of all kinds, and its exit statuses.  What it says of a source, the cases
-of cdef_check_test.py test.
+of check_test.py test.
 """
 
 import json
@@ -213,7 +213,7 @@ def findings_and_messages(test):
 
 
 class Editors(unittest.TestCase):
-    """What the files for editors make of messages, with a column and without one; for vim see cdef_check_vim_test.py."""
+    """What the files for editors make of messages, with a column and without one; for vim see vim_test.py."""
 
     def setUp(self):
         self.findings, self.messages = findings_and_messages(self)

@@ -4,7 +4,7 @@ import os
 import pathlib
 import re
 
-TESTS = pathlib.Path(__file__).resolve().parent
+TESTS = pathlib.Path(__file__).resolve().parents[1]
 PROJECT = TESTS.parent
 EXAMPLES = PROJECT / "examples"
 

@@ -10,7 +10,7 @@ import subprocess
 import tempfile
 import unittest
 
-import cdef_check_use_test as use
+import use_test as use
 
 
 @unittest.skipIf(shutil.which("vim") is None, "there is no vim")

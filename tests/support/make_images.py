@@ -37,13 +37,10 @@ import json
 import pathlib
 import re
 import struct
-import sys
 
-HERE = pathlib.Path(__file__).resolve().parent
-sys.path.insert(0, str(HERE.parent))
+import cdb_image
 
-import cdb_image  # noqa: E402  (the path has to be set first)
-
+HERE = pathlib.Path(__file__).resolve().parents[1] / "image"
 ORDERS = ("little", "big")
 WIDTHS = {"u8": 1, "u16": 2, "u32": 4}
 DOCUMENT = HERE.parent.parent / "docs" / "format.md"

@@ -3,7 +3,7 @@
 For a source that is right: it compiles, silently; the database says what the
 source says; its size and checksum are right; it comes out the same the second
 time, in another directory, under other settings of language and time zone, and
-with options n and d; option s gives what tests/reverse_cdb.py makes of it, and
+with options n and d; option s gives what support/reverse_cdb.py makes of it, and
 turning that once more gives the first again; cdef verify finds nothing wrong
 with either; and the source that cdef source writes gives the same database.
 

@@ -3,7 +3,7 @@
 import pathlib
 import re
 
-PROJECT = pathlib.Path(__file__).resolve().parents[1]
+PROJECT = pathlib.Path(__file__).resolve().parents[2]
 DOCUMENTS = sorted([*PROJECT.glob("*.md"), *(PROJECT / "docs").glob("*.md")])
 PAGES = sorted((PROJECT / "man").glob("*.[15]"))
 

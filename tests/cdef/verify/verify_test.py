@@ -1,7 +1,7 @@
 """Test `cdef verify`: what it prints, its exit statuses, and that it finds no
 error in anything that the compiler makes.
 
-The images are those of image/make_images.py.
+The images are those that support/make_images.py makes.
 """
 
 import json

@@ -1,6 +1,6 @@
 """Holds the names in the documents and the manual pages against those that the compiler and the format have.
 
-They come from the program tests/tools/list_names.cpp.
+They come from the program tests/support/list_names.cpp.
 """
 
 import collections

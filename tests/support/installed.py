@@ -8,8 +8,9 @@ import tempfile
 import time
 import unittest
 
-PROJECT = pathlib.Path(__file__).resolve().parents[2]
-BUILD = pathlib.Path(os.environ.get("CDGEN_BUILD", PROJECT / "build" / "package"))
+from programs import PROGRAMS, PROJECT
+
+BUILD = PROGRAMS.build
 TIMEOUT = 600
 MOVED = "moved elsewhere"  # a blank in a path is what build systems stumble over
 

@@ -9,8 +9,6 @@ namespace cdef::check {
 
 namespace {
 
-constexpr size_t PIECE = 254; /* characters of a line that one read takes, the newline included */
-
 bool is_attribute_kind(int kind) {
     return kind >= 0 && sc_tables[index_of(kind)].sc_attr != nullptr;
 }
@@ -32,7 +30,7 @@ std::string_view session::value_text() const {
 /* ---- Lines ---------------------------------------------------------------------------------------------------- */
 
 void session::watch_line(const source_line &source) {
-    bool whole_piece = compiler.is_cut(source) && raw.size() == PIECE;
+    bool whole_piece = compiler.is_cut(source) && raw.size() == LINE_MAX_CHARS;
     rest_of_line = seen.piece != 0;
     if (rest_of_line && !seen.piece_told)
         warn_at(

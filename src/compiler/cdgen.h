@@ -6,10 +6,11 @@
 #define CDGEN_CDGEN_H
 
 #include "cdb.h"
+#include "compiler/cdgen_catalogue.h"
 #include "compiler/cdgen_error.h"
 #include "compiler/cdgen_observer.h"
 #include "format/names.h"
-#include "language/name_index.h"
+#include "language/limits.h"
 
 #include <array>
 #include <cstddef>
@@ -219,136 +220,7 @@ vx_uint32_t init_scalar_sd(cdgen &cx, tbl *str_tbl, tbl_anchor *anchor, vx_uint3
 vx_uint32_t init_array_sd(cdgen &cx, tbl *str_tbl, tbl_anchor *array_anchor, tbl_anchor *sd_anchor,
                           vx_uint32_t array_cnt, vx_uint32_t sd_cnt, vx_value_t *out_data);
 
-/* ---- Stanza catalogue (cdgen_catalogue.cpp) ------------------------------------------------------------------- */
-
-/* Indexes of sc_tables. */
-enum stanza_id {
-    SC_CONTROL_DEFINITION,
-    SC_CLASS_TO_MANAGER_MAPPING,
-    SC_RESOURCE_VARIABLE_CLASS,
-    SC_RESOURCE_CLASS,
-    SC_PERSISTENT_RESOURCE_ATTRIBUTE,
-    SC_PERSISTENT_CLASS_ATTRIBUTE,
-    SC_DYNAMIC_RESOURCE_ATTRIBUTE,
-    SC_DYNAMIC_CLASS_ATTRIBUTE,
-    SC_CLASS_ACTION,
-    SC_RESOURCE_ACTION,
-    SC_PATTR_SD_DEFINITION,
-    SC_DATTR_SD_DEFINITION,
-    SC_DEFINE_SD_DEFINITION,
-    SC_UNDEFINE_SD_DEFINITION,
-    SC_ONLINE_SD_DEFINITION,
-    SC_OFFLINE_SD_DEFINITION,
-    SC_RESET_SD_DEFINITION,
-    SC_ACTION_IN_SD_DEFINITION,
-    SC_ACTION_OUT_SD_DEFINITION,
-    SC_COUNT
-};
-
-enum sd_type_t {
-    SD_TYPE_ONLINE,
-    SD_TYPE_OFFLINE,
-    SD_TYPE_DEFINE,
-    SD_TYPE_UNDEFINE,
-    SD_TYPE_RESET,
-    SD_TYPE_ACT_IN,
-    SD_TYPE_ACT_RESP,
-    SD_TYPE_PATTR,
-    SD_TYPE_DATTR,
-    SD_TYPE_UNKNOWN
-};
-
-constexpr vx_uint32_t OPTIONAL = 0x80000000u; /* in req_bit: the attribute is optional */
-
-/* How an attribute's text is converted and stored: an index of the value handlers. */
-enum attr_type {
-    AT_UINT8 = 0, /* no attribute uses it */
-    AT_UINT16 = 1,
-    AT_UINT32 = 2, /* no attribute uses it */
-    AT_STRING = 3,
-    AT_CLASS_PROPS = 4,
-    AT_VERSION = 5,
-    AT_PERM_TEMPLATE = 6,
-    AT_MANAGER = 7,
-    AT_LOCATOR = 8,
-    AT_ID = 9,
-    AT_VARIETY = 10,
-    AT_PATTR_PROPS = 11,
-    AT_DATTR_PROPS = 12,
-    AT_ACTION_PROPS = 13,
-    AT_VALID_VALUE = 14,
-    AT_DEFAULT_VALUE = 15,
-    AT_VALUE_DISPLAY = 16,
-    AT_DATA_TYPE = 17,
-    AT_VARIABLE_TYPE = 18,
-    AT_RANGE = 19,
-    AT_INITIAL_VALUE = 20,
-    AT_SD_INDEX = 21,
-    AT_SD_NAME = 22,
-    AT_SD_DESCRIPTION = 23,
-    AT_SD_DISPLAY = 24,
-    AT_SD_DATA_TYPE = 25,
-    AT_SD_VALID_VALUE = 26,
-    AT_SD_VALUE_DISPLAY = 27,
-    AT_SD_DEFAULT_VALUE = 28,
-    AT_LIST_ACTION_CLASS = 29,
-    AT_LIST_ACTION_RSRC = 30,
-    AT_PERMISSION = 31,
-    AT_COUNT
-};
-
-struct table_attrs {
-    const char *ta_name;
-    int ta_type;         /* attr_type */
-    int ta_offset;       /* of the field in the stanza's staging record */
-    vx_uint32_t req_bit; /* the attribute's bit in req_mask or, with OPTIONAL added, in opt_mask */
-    int dup_allowed;     /* may stand several times in one stanza */
-    size_t ta_length = std::string_view(ta_name).size();
-};
-
-/* What sets the four attribute kinds apart while their lines are parsed. */
-struct attr_kind {
-    vx_uint16_t cdgen::*vv_found; /* the stanza already has its valid-value list */
-    int sd_attr_type;             /* 0 persistent, 1 dynamic */
-    int value_offset;             /* ra_dflt_value or ra_init_value */
-    int sd_offset;                /* u_ra_sd */
-    int max_sd_idx_offset;        /* ra_max_sd_idx */
-};
-
-/* Where the SD section of a run is referred from; for attribute runs the attribute itself says so. */
-struct sd_owner {
-    sd_type_t type;
-    cdb_ref_t rsrc_class_t::*of_class;
-    cdb_ref_t rsrc_action_t::*of_action;
-};
-
-/* A stanza kind. The staging record and tables belong to a context. */
-struct srtable_ctrl {
-    const char *sc_name;
-    void *(*sc_cb)(cdgen &);
-    std::span<const table_attrs> sc_attrs;
-    name_index sc_attr_names; /* of sc_attrs */
-    void (*sc_init_tbl)(cdgen &);
-    vx_uint32_t req_mask_cmplt; /* what req_mask is when every required attribute has been seen */
-    tbl *(*sc_str_tbl)(cdgen &);
-    tbl *(*sc_vty_tbl)(cdgen &);
-    tbl *(*sc_vv_tbl)(cdgen &);
-    tbl *(*sc_sd_tbl)(cdgen &);
-    int dt_offset;               /* of the data type in the staging record; -1 without one */
-    const attr_kind *sc_attr;    /* attribute kinds only */
-    const sd_owner *sc_sd_owner; /* SD kinds only */
-};
-
-extern const std::array<srtable_ctrl, SC_COUNT + 1> sc_tables; /* the last one ends it: no name */
-
-/* The index of a stanza kind by its exact name, or -1. */
-int set_table_id(const char *name);
-/* A kind's attribute by its exact name, or null. */
-const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name);
-/* Non-null when the kind's name says that it defines structured data; that of an attribute. */
-const char *is_SD_stanza(int table_id);
-const char *is_attr_SD(int table_id);
-sd_type_t SD_stanza_type(int table_id);
+/* ---- What stanzas leave ---------------------------------------------------------------------------------------- */
 
 /* Values that wait for their attribute to be completed: one 8-byte cell each, for an SD-typed attribute the types of
  * its elements. */
@@ -403,7 +275,7 @@ struct source_file {
     std::array<char, SOURCE_BUFFER + 1> buffer;
 };
 
-constexpr size_t LOCATOR_SIZE = 1798; /* the longest value and its NUL */
+constexpr size_t LOCATOR_SIZE = VALUE_MAX_CHARS + 1; /* the longest value and its NUL */
 
 /* A Locator that waits for the attribute it names. */
 struct _rc_locator_t {
@@ -423,8 +295,6 @@ struct tbl_pair {
     const rsrc_variable_class_t *rvcp;
     tbl *tp;
 };
-
-constexpr size_t TBL_ENTRIES_MAX = 100;
 
 struct free_memory {
     void operator()(void *p) const {
@@ -525,7 +395,7 @@ struct cdgen {
     std::vector<size_t> nowhere;         /* their places in the image, in bytes */
 
     /* Variable IDs */
-    std::array<tbl_pair, TBL_ENTRIES_MAX> tbl_entries = {};
+    std::array<tbl_pair, VARIABLE_CLASSES_MAX> tbl_entries = {};
     size_t tbl_entry_used = 0;
 
     /* Image builder. The image is reached by copying: sections are not aligned. */

@@ -1,12 +1,11 @@
 /* cdgen_attr.cpp: one attribute line: its syntax, the order and repetition rules. */
 
 #include "compiler/cdgen_attr.h"
+#include "compiler/cdgen_stanzas.h"
 
 #include <cstdio>
 
 namespace {
-
-constexpr size_t VALUE_MAX_CHARS = LOCATOR_SIZE - 1;
 
 /* The name and value of a line, each ended by a NUL; no value when there is nothing to store. */
 struct name_value {
@@ -69,12 +68,13 @@ void count_required(cdgen &cx, stanza_state &state, const table_attrs &attr) {
 } // namespace
 
 void save_attr(cdgen &cx, char *il, int table_id) {
-    auto kind = static_cast<size_t>(table_id);
     char *name = il + strspn(il, " \t");
-    save_attr_line(cx, {il, name, name + strlen(name)}, sc_tables[kind], cx.stanzas[kind]);
+    save_attr_line(cx, {il, name, name + strlen(name)}, static_cast<stanza_id>(table_id));
 }
 
-void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, stanza_state &state) {
+void save_attr_line(cdgen &cx, const attr_text &text, stanza_id kind) {
+    const srtable_ctrl &scp = sc_tables[kind];
+    stanza_state &state = cx.stanzas[kind];
     auto [name, value, length] = split_line(cx, text);
     if (value == nullptr)
         return;
@@ -94,5 +94,5 @@ void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, s
     else
         count_required(cx, state, attr);
     cx.line_texts.clear();
-    store_value({cx, scp, state, static_cast<char *>(scp.sc_cb(cx)), attr, value, length});
+    store_value({cx, scp, state, sc_cb(cx, scp), attr, value, length});
 }

@@ -23,7 +23,7 @@ struct attr_text {
 };
 
 /* What save_attr does. */
-void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, stanza_state &state);
+void save_attr_line(cdgen &cx, const attr_text &text, stanza_id kind);
 
 /* Converts the value and stores it, by the attribute's type. */
 void store_value(const attr_line &line);

@@ -1,6 +1,7 @@
 /* cdgen_attr_values.cpp: the value handler of each attribute type. */
 
 #include "compiler/cdgen_attr.h"
+#include "compiler/cdgen_stanzas.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -33,7 +34,7 @@ vx_data_type_t data_type(const attr_line &line) {
 }
 
 tbl *strings_of(const attr_line &line) {
-    tbl *strings = line.scp.sc_str_tbl(line.cx);
+    tbl *strings = sc_str_tbl(line.cx, line.scp);
     if (strings == nullptr)
         source_error(line.cx, MSG_NO_STRING_TABLE);
     return strings;
@@ -138,7 +139,7 @@ void store_variety(const attr_line &line) {
     char *high = after_comma(line);
     if (high == nullptr)
         source_error(line.cx, MSG_INVALID_VARIETY);
-    tbl *varieties = line.scp.sc_vty_tbl(line.cx);
+    tbl *varieties = sc_vty_tbl(line.cx, line.scp);
     auto list = load<vx_uint32_t>(field_of(line));
     size_t at = next_entry(line.cx, varieties, list, &variety_list_t::vl_count, offsetof(variety_list_t, vl_values),
                            sizeof(vl_entry_t));
@@ -184,7 +185,7 @@ void store_bounds(const attr_line &line, vx_data_type_t type, vv_entry_t *entry)
 /* Adds to the list at the field's offset; entries of a list are of the owner's scalar type. */
 void add_valid_value(const attr_line &line) {
     cdgen &cx = line.cx;
-    tbl *lists = line.scp.sc_vv_tbl(cx);
+    tbl *lists = sc_vv_tbl(cx, line.scp);
     auto list = load<vx_uint32_t>(field_of(line));
     size_t at =
         next_entry(cx, lists, list, &valid_values_t::vv_count, offsetof(valid_values_t, vv_values), sizeof(vv_entry_t));
@@ -196,7 +197,7 @@ void add_valid_value(const attr_line &line) {
 }
 
 void store_valid_value(const attr_line &line) {
-    vx_uint16_t &found = line.cx.*(line.scp.sc_attr->vv_found);
+    vx_uint16_t &found = vv_found(line.cx, line.scp);
     if (!found) {
         store(field_of(line), mk_vv_sec(line.cx));
         found = 1;
@@ -208,7 +209,7 @@ void store_value_display(const attr_line &line) {
     cdgen &cx = line.cx;
     if (!cx.vvdisp.has_value())
         source_error(cx, MSG_NO_VALID_VALUE);
-    *record_at<vx_uint16_t>(line.scp.sc_vv_tbl(cx), *cx.vvdisp) = static_cast<vx_uint16_t>(integer(line, line.value));
+    *record_at<vx_uint16_t>(sc_vv_tbl(cx, line.scp), *cx.vvdisp) = static_cast<vx_uint16_t>(integer(line, line.value));
 }
 
 /* ---- Data types, defaults and ranges --------------------------------------------------------------------------- */

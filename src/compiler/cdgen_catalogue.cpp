@@ -1,8 +1,9 @@
-/* cdgen_catalogue.cpp: the source language as data: stanza kinds, their attributes, property and permission names. */
+/* catalogue.cpp: the source language as data: stanza kinds and their attributes. */
 
-#include "compiler/cdgen.h"
+#include "compiler/cdgen_catalogue.h"
 
-#include <string_view>
+#include <cstddef>
+#include <cstring>
 
 namespace {
 
@@ -130,16 +131,13 @@ constexpr vx_uint32_t required_mask(std::span<const table_attrs> attrs) {
  * optional attribute. */
 constexpr vx_uint32_t ACTION_OUT_MASK = required_mask(sd_attrs) | 0x20 | 0x40;
 
-#define ATTR_KIND(record, vv_found, sd_attr_type, value)                                                               \
+#define ATTR_KIND(record, sd_attr_type, value)                                                                         \
     attr_kind {                                                                                                        \
-        &cdgen::vv_found, sd_attr_type, offsetof(record, value), offsetof(record, u_ra_sd),                            \
-            offsetof(record, ra_max_sd_idx)                                                                            \
+        sd_attr_type, offsetof(record, value), offsetof(record, u_ra_sd), offsetof(record, ra_max_sd_idx)              \
     }
 
-constexpr attr_kind pattr_kind = ATTR_KIND(rsrc_pattr_t, pattr_vv_found, 0, ra_dflt_value);
-constexpr attr_kind pattrC_kind = ATTR_KIND(rsrc_pattr_t, pattrC_vv_found, 0, ra_dflt_value);
-constexpr attr_kind dattr_kind = ATTR_KIND(rsrc_dattr_t, dattr_vv_found, 1, ra_init_value);
-constexpr attr_kind dattrC_kind = ATTR_KIND(rsrc_dattr_t, dattrC_vv_found, 1, ra_init_value);
+constexpr attr_kind pattr_kind = ATTR_KIND(rsrc_pattr_t, 0, ra_dflt_value);
+constexpr attr_kind dattr_kind = ATTR_KIND(rsrc_dattr_t, 1, ra_init_value);
 
 constexpr sd_owner pattr_owner = {SD_TYPE_PATTR, nullptr, nullptr};
 constexpr sd_owner dattr_owner = {SD_TYPE_DATTR, nullptr, nullptr};
@@ -155,52 +153,35 @@ template <std::size_t Count> consteval name_index names_of(const table_attrs (&a
     return {Count, [&](std::size_t i) { return std::string_view(attrs[i].ta_name); }};
 }
 
-template <auto Record> void *record(cdgen &cx) {
-    return &(cx.*Record);
-}
-
-template <auto Record, auto Field> tbl *table(cdgen &cx) {
-    return staged_tbl((cx.*Record).*Field);
-}
-
-tbl *no_table(cdgen &) {
-    return nullptr;
-}
-
-constexpr auto class_record = &cdgen::cb_rsrc_class;
-constexpr auto class_strings = &table<class_record, &rsrc_class_t::u_rc_strings>;
-constexpr auto class_varieties = &table<class_record, &rsrc_class_t::u_rc_variety_lists>;
-constexpr auto class_valid_vals = &table<class_record, &rsrc_class_t::u_rc_valid_vals>;
-constexpr auto class_sd_defs = &table<class_record, &rsrc_class_t::u_rc_sd_defs>;
-constexpr auto cmmap_strings = &table<&cdgen::cb_rsrc_cmmap, &rsrc_cmmap_t::u_rcm_strings>;
-constexpr auto variable_class_strings =
-    &table<&cdgen::cb_rsrc_variable_class, &rsrc_variable_class_t::u_rvc_string_tbl>;
-
-/* A kind that stores into the open class's tables: all but two. */
-template <auto Record, std::size_t Count>
-consteval srtable_ctrl of_class(const char *name, const table_attrs (&attrs)[Count], void (*init)(cdgen &),
-                                int dt_offset = -1, const attr_kind *kind = nullptr, const sd_owner *owner = nullptr) {
+template <std::size_t Count>
+consteval srtable_ctrl stanza(const char *name, staged_record record, const table_attrs (&attrs)[Count],
+                              staged_tables tables = TABLES_OF_CLASS) {
     return {.sc_name = name,
-            .sc_cb = record<Record>,
+            .sc_record = record,
+            .sc_side_tables = tables,
             .sc_attrs = attrs,
             .sc_attr_names = names_of(attrs),
-            .sc_init_tbl = init,
             .req_mask_cmplt = required_mask(attrs),
-            .sc_str_tbl = class_strings,
-            .sc_vty_tbl = class_varieties,
-            .sc_vv_tbl = class_valid_vals,
-            .sc_sd_tbl = class_sd_defs,
-            .dt_offset = dt_offset,
-            .sc_attr = kind,
-            .sc_sd_owner = owner};
+            .dt_offset = -1,
+            .sc_attr = nullptr,
+            .sc_sd_owner = nullptr};
+}
+
+template <std::size_t Count>
+consteval srtable_ctrl attribute(const char *name, staged_record record, const table_attrs (&attrs)[Count],
+                                 const attr_kind &kind, int dt_offset) {
+    srtable_ctrl row = stanza(name, record, attrs);
+    row.dt_offset = dt_offset;
+    row.sc_attr = &kind;
+    return row;
 }
 
 consteval srtable_ctrl sd_stanza(const char *name, const sd_owner &owner,
                                  vx_uint32_t complete = required_mask(sd_attrs)) {
-    srtable_ctrl row = of_class<&cdgen::cb_sd_def>(name, sd_attrs, init_sd_tbl,
-                                                   offsetof(sd_def_t, sd_fields) + offsetof(sd_field_t, sd_field_type),
-                                                   nullptr, &owner);
+    srtable_ctrl row = stanza(name, STAGED_SD_DEF, sd_attrs);
+    row.dt_offset = offsetof(sd_def_t, sd_fields) + offsetof(sd_field_t, sd_field_type);
     row.req_mask_cmplt = complete;
+    row.sc_sd_owner = &owner;
     return row;
 }
 
@@ -208,42 +189,16 @@ constexpr int PATTR_TYPE = offsetof(rsrc_pattr_t, ra_data_type);
 constexpr int DATTR_TYPE = offsetof(rsrc_dattr_t, ra_data_type);
 
 constexpr std::array<srtable_ctrl, SC_COUNT + 1> catalogue = {{
-    of_class<class_record>("ControlDefinition", control_attrs, init_class_tbl),
-    {.sc_name = "ClassToManagerMapping",
-     .sc_cb = record<&cdgen::cb_rsrc_cmmap>,
-     .sc_attrs = cmmap_attrs,
-     .sc_attr_names = names_of(cmmap_attrs),
-     .sc_init_tbl = init_cmmap_tbl,
-     .req_mask_cmplt = required_mask(cmmap_attrs),
-     .sc_str_tbl = cmmap_strings,
-     .sc_vty_tbl = no_table,
-     .sc_vv_tbl = no_table,
-     .sc_sd_tbl = no_table,
-     .dt_offset = -1,
-     .sc_attr = nullptr,
-     .sc_sd_owner = nullptr},
-    {.sc_name = "ResourceVariableClass",
-     .sc_cb = record<&cdgen::cb_rsrc_variable_class>,
-     .sc_attrs = variable_class_attrs,
-     .sc_attr_names = names_of(variable_class_attrs),
-     .sc_init_tbl = init_var_class_tbl,
-     .req_mask_cmplt = required_mask(variable_class_attrs),
-     .sc_str_tbl = variable_class_strings,
-     .sc_vty_tbl = no_table,
-     .sc_vv_tbl = no_table,
-     .sc_sd_tbl = class_sd_defs,
-     .dt_offset = -1,
-     .sc_attr = nullptr,
-     .sc_sd_owner = nullptr},
-    of_class<class_record>("ResourceClass", class_attrs, init_class_tbl_fake),
-    of_class<&cdgen::cb_rsrc_pattr>("PersistentResourceAttribute", pattr_attrs, init_pattr_tbl, PATTR_TYPE,
-                                    &pattr_kind),
-    of_class<&cdgen::cb_rsrc_pattrC>("PersistentClassAttribute", pattr_attrs, init_pattrC_tbl, PATTR_TYPE,
-                                     &pattrC_kind),
-    of_class<&cdgen::cb_rsrc_dattr>("DynamicResourceAttribute", dattr_attrs, init_dattr_tbl, DATTR_TYPE, &dattr_kind),
-    of_class<&cdgen::cb_rsrc_dattrC>("DynamicClassAttribute", dattr_attrs, init_dattrC_tbl, DATTR_TYPE, &dattrC_kind),
-    of_class<&cdgen::cb_rsrc_actionC>("ClassAction", action_attrs, init_actionC_tbl),
-    of_class<&cdgen::cb_rsrc_action>("ResourceAction", action_attrs, init_action_tbl),
+    stanza("ControlDefinition", STAGED_CLASS, control_attrs),
+    stanza("ClassToManagerMapping", STAGED_CMMAP, cmmap_attrs, TABLES_OF_CMMAP),
+    stanza("ResourceVariableClass", STAGED_VARIABLE_CLASS, variable_class_attrs, TABLES_OF_VARIABLE_CLASS),
+    stanza("ResourceClass", STAGED_CLASS, class_attrs),
+    attribute("PersistentResourceAttribute", STAGED_PATTR, pattr_attrs, pattr_kind, PATTR_TYPE),
+    attribute("PersistentClassAttribute", STAGED_PATTR_C, pattr_attrs, pattr_kind, PATTR_TYPE),
+    attribute("DynamicResourceAttribute", STAGED_DATTR, dattr_attrs, dattr_kind, DATTR_TYPE),
+    attribute("DynamicClassAttribute", STAGED_DATTR_C, dattr_attrs, dattr_kind, DATTR_TYPE),
+    stanza("ClassAction", STAGED_ACTION_C, action_attrs),
+    stanza("ResourceAction", STAGED_ACTION, action_attrs),
     sd_stanza("PAttrSDDefinition", pattr_owner),
     sd_stanza("DAttrSDDefinition", dattr_owner),
     sd_stanza("DefineSDDefinition", define_owner),
@@ -279,13 +234,27 @@ constinit const std::array<srtable_ctrl, SC_COUNT + 1> sc_tables = catalogue;
 
 int set_table_id(const char *name) {
     int id = stanza_names.candidate(name);
-    return id >= 0 && strcmp(sc_tables[static_cast<size_t>(id)].sc_name, name) == 0 ? id : -1;
+    return id >= 0 && std::strcmp(sc_tables[static_cast<std::size_t>(id)].sc_name, name) == 0 ? id : -1;
 }
 
 const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name) {
     int at = scp.sc_attr_names.candidate(name);
     if (at < 0)
         return nullptr;
-    const table_attrs &attr = scp.sc_attrs[static_cast<size_t>(at)];
-    return name.size() == attr.ta_length && memcmp(name.data(), attr.ta_name, attr.ta_length) == 0 ? &attr : nullptr;
+    const table_attrs &attr = scp.sc_attrs[static_cast<std::size_t>(at)];
+    return name.size() == attr.ta_length && std::memcmp(name.data(), attr.ta_name, attr.ta_length) == 0 ? &attr
+                                                                                                        : nullptr;
+}
+
+const char *is_SD_stanza(int table_id) {
+    return std::strstr(sc_tables[static_cast<std::size_t>(table_id)].sc_name, "SDDefinition");
+}
+
+const char *is_attr_SD(int table_id) {
+    return std::strstr(sc_tables[static_cast<std::size_t>(table_id)].sc_name, "AttrSDDefinition");
+}
+
+sd_type_t SD_stanza_type(int table_id) {
+    const sd_owner *owner = sc_tables[static_cast<std::size_t>(table_id)].sc_sd_owner;
+    return owner == nullptr ? SD_TYPE_UNKNOWN : owner->type;
 }

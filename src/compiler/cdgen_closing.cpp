@@ -26,7 +26,7 @@ void drop_values(cdgen &cx) {
 
 /* The ID of the last class's persistent resource attribute with the locator's name; an unknown name is no error. */
 vx_uint16_t locator_id(cdgen &cx) {
-    tbl *strings = sc_tables[SC_PERSISTENT_RESOURCE_ATTRIBUTE].sc_str_tbl(cx);
+    tbl *strings = staged_tbl(cx.cb_rsrc_class.u_rc_strings);
     for (const rsrc_pattr_t &attr : records_of<rsrc_pattr_t>(staged_tbl(cx.cb_rsrc_class.u_rc_pattrs))) {
         const auto *name = static_cast<const char *>(tbl_at(strings, attr.u_ra_name.offset[0], 1));
         if (strcmp(name, cx._rc_locator.name) == 0)

@@ -10,6 +10,7 @@ namespace {
 struct dattr_kind {
     stanza_id id;
     rsrc_dattr_t cdgen::*record;
+    vx_uint16_t cdgen::*vv_found; /* the stanza already has its list of valid values */
     cdb_ref_t rsrc_class_t::*records;
     vx_uint32_t cb_id;
     bool shows_masks; /* deliberate: only the class kind prints its masks before it is found incomplete */
@@ -17,20 +18,18 @@ struct dattr_kind {
 
 constexpr dattr_kind resource_kind = {.id = SC_DYNAMIC_RESOURCE_ATTRIBUTE,
                                       .record = &cdgen::cb_rsrc_dattr,
+                                      .vv_found = &cdgen::dattr_vv_found,
                                       .records = &rsrc_class_t::u_rc_dattrs,
                                       .cb_id = CDB_ID_DATTR,
                                       .shows_masks = false};
 constexpr dattr_kind class_kind = {.id = SC_DYNAMIC_CLASS_ATTRIBUTE,
                                    .record = &cdgen::cb_rsrc_dattrC,
+                                   .vv_found = &cdgen::dattrC_vv_found,
                                    .records = &rsrc_class_t::u_rc_dattrsC,
                                    .cb_id = CDB_ID_DATTR_C,
                                    .shows_masks = true};
 
 constexpr message_id NO_CLASS = MSG_NO_CLASS_FOR_DATTR;
-
-vx_uint16_t &valid_vals_found(cdgen &cx, const dattr_kind &kind) {
-    return cx.*(sc_tables[kind.id].sc_attr->vv_found);
-}
 
 /* Whether or not a range was given. */
 bool has_no_range(vx_data_type_t type) {
@@ -90,7 +89,7 @@ void open_dattr(cdgen &cx, const dattr_kind &kind) {
     if (kind.id == resource_kind.id)
         cx.dattr_range_type = VX_UNKNOWN;
     cx.vvdisp.reset();
-    valid_vals_found(cx, kind) = 0;
+    cx.*kind.vv_found = 0;
 }
 
 void show_masks(cdgen &cx, stanza_id id) {
@@ -107,7 +106,7 @@ void complete_dattr(cdgen &cx, const dattr_kind &kind) {
         if (kind.shows_masks)
             show_masks(cx, kind.id);
         require_complete(cx, kind.id);
-        settle_valid_vals(attr, valid_vals_found(cx, kind));
+        settle_valid_vals(attr, cx.*kind.vv_found);
         settle_range(cx, attr);
         settle_initial_value(cx, kind, attr);
         settle_group(attr, cx.stanzas[kind.id]);

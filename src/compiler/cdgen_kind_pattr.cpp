@@ -12,6 +12,7 @@ constexpr vx_uint32_t OPT_FOR_DEFINE = 0x8;
 struct pattr_kind {
     stanza_id id;
     rsrc_pattr_t cdgen::*record;
+    vx_uint16_t cdgen::*vv_found; /* the stanza already has its list of valid values */
     cdb_ref_t rsrc_class_t::*records;
     vx_uint32_t cb_id;
     message_id no_class;
@@ -21,6 +22,7 @@ struct pattr_kind {
 
 constexpr pattr_kind resource_kind = {.id = SC_PERSISTENT_RESOURCE_ATTRIBUTE,
                                       .record = &cdgen::cb_rsrc_pattr,
+                                      .vv_found = &cdgen::pattr_vv_found,
                                       .records = &rsrc_class_t::u_rc_pattrs,
                                       .cb_id = CDB_ID_PATTR,
                                       .no_class = MSG_NO_CLASS_FOR_PATTR,
@@ -28,15 +30,12 @@ constexpr pattr_kind resource_kind = {.id = SC_PERSISTENT_RESOURCE_ATTRIBUTE,
                                       .uses_default_values = true};
 constexpr pattr_kind class_kind = {.id = SC_PERSISTENT_CLASS_ATTRIBUTE,
                                    .record = &cdgen::cb_rsrc_pattrC,
+                                   .vv_found = &cdgen::pattrC_vv_found,
                                    .records = &rsrc_class_t::u_rc_pattrsC,
                                    .cb_id = CDB_ID_PATTR_C,
                                    .no_class = MSG_NO_CLASS_FOR_PATTR_C,
                                    .valid_vals_absent_at_open = true,
                                    .uses_default_values = false};
-
-vx_uint16_t &valid_vals_found(cdgen &cx, const pattr_kind &kind) {
-    return cx.*(sc_tables[kind.id].sc_attr->vv_found);
-}
 
 /* Structured data get their default from the SD stanzas that follow. */
 void settle_default(cdgen &cx, const pattr_kind &kind, rsrc_pattr_t &attr) {
@@ -61,7 +60,7 @@ void open_pattr(cdgen &cx, const pattr_kind &kind) {
         mark_absent(attr.u_ra_valid_vals);
     attr.ra_max_sd_idx = NO_SD_IDX;
     cx.vvdisp.reset();
-    valid_vals_found(cx, kind) = 0;
+    cx.*kind.vv_found = 0;
 }
 
 void complete_pattr(cdgen &cx, const pattr_kind &kind) {
@@ -69,7 +68,7 @@ void complete_pattr(cdgen &cx, const pattr_kind &kind) {
         rsrc_pattr_t &attr = cx.*kind.record;
         require_class(cx, kind.no_class);
         require_complete(cx, kind.id);
-        settle_valid_vals(attr, valid_vals_found(cx, kind));
+        settle_valid_vals(attr, cx.*kind.vv_found);
         settle_default(cx, kind, attr);
         if ((attr.ra_props & (REQD_FOR_DEFINE | OPT_FOR_DEFINE)) == 0)
             attr.ra_props |= INVAL_FOR_DEFINE;

@@ -49,7 +49,7 @@ void default_class_name(cdgen &cx) {
     auto length = static_cast<size_t>(suffix - cx.cdefname);
     std::unique_ptr<char, free_memory> name(static_cast<char *>(cfg_malloc(length + 1)));
     memcpy(name.get(), cx.cdefname, length);
-    tbl *strings = sc_tables[SC_RESOURCE_CLASS].sc_str_tbl(cx);
+    tbl *strings = staged_tbl(cx.cb_rsrc_class.u_rc_strings);
     if (strings == nullptr)
         source_error(cx, MSG_NO_STRING_TABLE);
     cx.cb_rsrc_class.u_rc_name.offset[0] = add_to_tbl(cx, strings, name.get(), length + 1);

@@ -2,6 +2,8 @@
 
 #include "compiler/cdgen_read.h"
 
+#include "compiler/cdgen_stanzas.h"
+
 #include <algorithm>
 #include <cerrno>
 #include <fcntl.h>
@@ -10,8 +12,6 @@
 #include <unistd.h>
 
 namespace {
-
-constexpr size_t LINE_MAX_CHARS = 254; /* taken by one read, the newline included */
 
 /* What may end a line's text before its newline: quotes and comments, and the NUL behind the last byte. They are rare.
  * Where the next one stands is found once, however many lines stand before it. */
@@ -152,7 +152,7 @@ void begin_sd_stanza(cdgen &cx) {
         if (!of_attribute)
             forget_values(cx, state.dflt);
     }
-    cx.scp->sc_init_tbl(cx);
+    sc_init_tbl (*cx.scp)(cx);
     state.req_mask = state.opt_mask = 0;
 }
 
@@ -164,7 +164,7 @@ void begin_plain_stanza(cdgen &cx) {
         cmplt_action_tbl(cx);
     if (cx.cb_rsrc_actionC.ac_cb_ID != 0)
         cmplt_actionC_tbl(cx);
-    cx.scp->sc_init_tbl(cx);
+    sc_init_tbl (*cx.scp)(cx);
     forget_values(cx, cx.state->dflt);
     cx.state->req_mask = cx.state->opt_mask = 0;
     cx.attr_dflt_val = nullptr;
@@ -244,7 +244,7 @@ void take_line(cdgen &cx, const attr_text &text) {
     else if (cx.table_id < 0)
         source_error(cx, MSG_NO_STANZA);
     else
-        save_attr_line(cx, text, *cx.scp, *cx.state);
+        save_attr_line(cx, text, static_cast<stanza_id>(cx.table_id));
 }
 
 namespace {
@@ -274,17 +274,4 @@ void cache_input_data(cdgen &cx, const char *filename) {
         if (text.end != nullptr)
             take_line(cx, text);
     }
-}
-
-const char *is_SD_stanza(int table_id) {
-    return strstr(sc_tables[static_cast<size_t>(table_id)].sc_name, "SDDefinition");
-}
-
-const char *is_attr_SD(int table_id) {
-    return strstr(sc_tables[static_cast<size_t>(table_id)].sc_name, "AttrSDDefinition");
-}
-
-sd_type_t SD_stanza_type(int table_id) {
-    const sd_owner *owner = sc_tables[static_cast<size_t>(table_id)].sc_sd_owner;
-    return owner == nullptr ? SD_TYPE_UNKNOWN : owner->type;
 }

@@ -3,6 +3,7 @@
 #include "compiler/stepwise.h"
 
 #include "compiler/cdgen_closing.h"
+#include "compiler/cdgen_stanzas.h"
 
 #include <tuple>
 
@@ -63,9 +64,9 @@ void stepwise_compiler::size_image() {
 
 /* ---- State ----------------------------------------------------------------------------------------------------- */
 
-bool stepwise_compiler::is_open(int kind) const {
+bool stepwise_compiler::is_open(int kind) {
     vx_uint32_t identifier = 0;
-    memcpy(&identifier, row_of(kind).sc_cb(const_cast<cdgen &>(cx)), sizeof identifier);
+    memcpy(&identifier, sc_cb(cx, row_of(kind)), sizeof identifier);
     return identifier != 0;
 }
 
@@ -73,10 +74,10 @@ int stepwise_compiler::previous_kind() const {
     return cx.prev_scp == nullptr ? -1 : static_cast<int>(cx.prev_scp - sc_tables.data());
 }
 
-vx_data_type_t stepwise_compiler::data_type() const {
+vx_data_type_t stepwise_compiler::data_type() {
     vx_data_type_t type = VX_UNKNOWN;
     if (cx.scp->dt_offset >= 0)
-        memcpy(&type, static_cast<char *>(cx.scp->sc_cb(const_cast<cdgen &>(cx))) + cx.scp->dt_offset, sizeof type);
+        memcpy(&type, sc_cb(cx, *cx.scp) + cx.scp->dt_offset, sizeof type);
     return type;
 }
 
@@ -91,7 +92,7 @@ bool stepwise_compiler::forge_class() {
 
 void stepwise_compiler::drop_record(int kind) {
     constexpr vx_uint32_t none = 0;
-    memcpy(row_of(kind).sc_cb(cx), &none, sizeof none);
+    memcpy(sc_cb(cx, row_of(kind)), &none, sizeof none);
 }
 
 void stepwise_compiler::complete_element() {
@@ -115,7 +116,7 @@ void stepwise_compiler::begin_run_of_nobody(int kind) {
     cx.scp = cx.curr_sd_scp = &row_of(kind);
     cx.state = &cx.stanzas[static_cast<size_t>(kind)];
     cx.table_id = kind;
-    cx.scp->sc_init_tbl(cx);
+    sc_init_tbl (*cx.scp)(cx);
     cx.state->req_mask = cx.state->opt_mask = 0;
     cx.state->dflt = {};
 }

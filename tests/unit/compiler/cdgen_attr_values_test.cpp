@@ -308,7 +308,7 @@ TEST(DataType, StructuredDataAwaitTheirRun) {
             bool dynamic = kind == DYNAMIC[0] || kind == DYNAMIC[1];
             c.cx.sd_attr_type = 9;
             EXPECT_EQ(fed(c, kind, std::string("DataType=") + name), WELL);
-            auto *record = static_cast<char *>(sc_tables[kind].sc_cb(c.cx));
+            auto *record = sc_cb(c.cx, sc_tables[kind]);
             EXPECT_EQ(reinterpret_cast<char *>(c.cx.attr_dflt_val), record + (dynamic ? 32 : 24));
             EXPECT_EQ(reinterpret_cast<char *>(c.cx.curr_sd_tbl), record + (dynamic ? 72 : 56));
             EXPECT_EQ(reinterpret_cast<char *>(c.cx.max_sd_idx), record + (dynamic ? 124 : 64));
@@ -404,7 +404,7 @@ TEST(Range, BoundsAreOfTheType) {
             opened c;
             if (kind == SC_DYNAMIC_CLASS_ATTRIBUTE)
                 close_resource_attribute(c);
-            const auto &attr = *static_cast<rsrc_dattr_t *>(sc_tables[kind].sc_cb(c.cx));
+            const auto &attr = *reinterpret_cast<rsrc_dattr_t *>(sc_cb(c.cx, sc_tables[kind]));
             EXPECT_EQ(fed(c, kind, std::string("DataType=") + type.type), WELL);
             EXPECT_EQ(fed(c, kind, "Range=7,9"), WELL);
             EXPECT_EQ(attr.ra_min_value.val_uint64, type.seven);

@@ -1,6 +1,7 @@
 /* The source language, a second time: every stanza kind, attribute, property and permission letter, written by hand. */
 
 #include "compiler/cdgen.h"
+#include "compiler/cdgen_stanzas.h"
 
 #include <gtest/gtest.h>
 
@@ -120,7 +121,7 @@ enum record_tables { CLASS_TABLES, MAP_TABLES, VARIABLE_CLASS_TABLES };
 
 struct kind_row {
     const char *name;
-    void *(*record)(cdgen &);
+    char *(*record)(cdgen &);
     void (*init)(cdgen &);
     vx_uint32_t complete;
     const attr_rows *attrs;
@@ -129,8 +130,8 @@ struct kind_row {
     sd_type_t sd;
 };
 
-template <auto Member> void *in(cdgen &cx) {
-    return &(cx.*Member);
+template <auto Member> char *in(cdgen &cx) {
+    return reinterpret_cast<char *>(&(cx.*Member));
 }
 
 constexpr auto CLASS = in<&cdgen::cb_rsrc_class>;
@@ -173,8 +174,8 @@ TEST(Catalogue, KindsStandInTheirOrder) {
     for (size_t i = 0; i < KINDS.size(); ++i) {
         SCOPED_TRACE(KINDS[i].name);
         EXPECT_STREQ(kind_at(i).sc_name, KINDS[i].name);
-        EXPECT_EQ(kind_at(i).sc_cb(cx), KINDS[i].record(cx));
-        EXPECT_EQ(kind_at(i).sc_init_tbl, KINDS[i].init);
+        EXPECT_EQ(sc_cb(cx, kind_at(i)), KINDS[i].record(cx));
+        EXPECT_EQ(sc_init_tbl(kind_at(i)), KINDS[i].init);
         EXPECT_EQ(kind_at(i).req_mask_cmplt, KINDS[i].complete);
         EXPECT_EQ(kind_at(i).dt_offset, KINDS[i].data_type);
     }
@@ -229,30 +230,35 @@ TEST(Catalogue, KindsReachTheirStagingTables) {
     for (size_t i = 0; i < KINDS.size(); ++i) {
         SCOPED_TRACE(KINDS[i].name);
         const tables_of_kind &tables = expected[KINDS[i].tables];
-        EXPECT_EQ(kind_at(i).sc_str_tbl(cx), tables.strings);
-        EXPECT_EQ(kind_at(i).sc_vty_tbl(cx), tables.varieties);
-        EXPECT_EQ(kind_at(i).sc_vv_tbl(cx), tables.valid_values);
-        EXPECT_EQ(kind_at(i).sc_sd_tbl(cx), tables.sd);
+        EXPECT_EQ(sc_str_tbl(cx, kind_at(i)), tables.strings);
+        EXPECT_EQ(sc_vty_tbl(cx, kind_at(i)), tables.varieties);
+        EXPECT_EQ(sc_vv_tbl(cx, kind_at(i)), tables.valid_values);
+        EXPECT_EQ(sc_sd_tbl(cx, kind_at(i)), tables.sd);
     }
 }
 
 TEST(Catalogue, AttributeKindsKnowTheirValueFields) {
-    const std::map<std::string, attr_kind> expected = {
-        {"PersistentResourceAttribute", {&cdgen::pattr_vv_found, 0, 24, 56, 64}},
-        {"PersistentClassAttribute", {&cdgen::pattrC_vv_found, 0, 24, 56, 64}},
-        {"DynamicResourceAttribute", {&cdgen::dattr_vv_found, 1, 32, 72, 124}},
-        {"DynamicClassAttribute", {&cdgen::dattrC_vv_found, 1, 32, 72, 124}}};
+    struct expected_row {
+        vx_uint16_t cdgen::*found;
+        attr_kind fields;
+    };
+    const std::map<std::string, expected_row> expected = {
+        {"PersistentResourceAttribute", {&cdgen::pattr_vv_found, {0, 24, 56, 64}}},
+        {"PersistentClassAttribute", {&cdgen::pattrC_vv_found, {0, 24, 56, 64}}},
+        {"DynamicResourceAttribute", {&cdgen::dattr_vv_found, {1, 32, 72, 124}}},
+        {"DynamicClassAttribute", {&cdgen::dattrC_vv_found, {1, 32, 72, 124}}}};
+    cdgen cx;
     for (size_t i = 0; i < KINDS.size(); ++i) {
         SCOPED_TRACE(KINDS[i].name);
         auto row = expected.find(KINDS[i].name);
         ASSERT_EQ(kind_at(i).sc_attr != nullptr, row != expected.end());
         if (row == expected.end())
             continue;
-        EXPECT_EQ(kind_at(i).sc_attr->vv_found, row->second.vv_found);
-        EXPECT_EQ(kind_at(i).sc_attr->sd_attr_type, row->second.sd_attr_type);
-        EXPECT_EQ(kind_at(i).sc_attr->value_offset, row->second.value_offset);
-        EXPECT_EQ(kind_at(i).sc_attr->sd_offset, row->second.sd_offset);
-        EXPECT_EQ(kind_at(i).sc_attr->max_sd_idx_offset, row->second.max_sd_idx_offset);
+        EXPECT_EQ(&vv_found(cx, kind_at(i)), &(cx.*row->second.found));
+        EXPECT_EQ(kind_at(i).sc_attr->sd_attr_type, row->second.fields.sd_attr_type);
+        EXPECT_EQ(kind_at(i).sc_attr->value_offset, row->second.fields.value_offset);
+        EXPECT_EQ(kind_at(i).sc_attr->sd_offset, row->second.fields.sd_offset);
+        EXPECT_EQ(kind_at(i).sc_attr->max_sd_idx_offset, row->second.fields.max_sd_idx_offset);
     }
 }
 

@@ -3,6 +3,7 @@
 #define CDGEN_TESTS_SOURCE_FIXTURE_H
 
 #include "compiler/cdgen.h"
+#include "compiler/cdgen_stanzas.h"
 
 #include <gtest/gtest.h>
 
@@ -263,7 +264,7 @@ inline size_t record_size(stanza_id kind) {
 
 /* The staging record of a kind. */
 inline std::string record_of(opened &c, stanza_id kind) {
-    return {static_cast<const char *>(sc_tables[kind].sc_cb(c.cx)), record_size(kind)};
+    return {sc_cb(c.cx, sc_tables[kind]), record_size(kind)};
 }
 
 /* A fed attribute: one line of a stanza whose required attributes are all there, unless it is one itself. */

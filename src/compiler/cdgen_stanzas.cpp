@@ -1,0 +1,85 @@
+/* cdgen_stanzas.cpp: the staging records and tables that the catalogue names. */
+
+#include "compiler/cdgen_stanzas.h"
+
+namespace {
+
+template <auto Record> char *record(cdgen &cx) {
+    return reinterpret_cast<char *>(&(cx.*Record));
+}
+
+/* By staged_record. */
+constexpr char *(*records[STAGED_COUNT])(cdgen &) = {
+    record<&cdgen::cb_rsrc_class>,          /* STAGED_CLASS */
+    record<&cdgen::cb_rsrc_cmmap>,          /* STAGED_CMMAP */
+    record<&cdgen::cb_rsrc_variable_class>, /* STAGED_VARIABLE_CLASS */
+    record<&cdgen::cb_rsrc_pattr>,          /* STAGED_PATTR */
+    record<&cdgen::cb_rsrc_pattrC>,         /* STAGED_PATTR_C */
+    record<&cdgen::cb_rsrc_dattr>,          /* STAGED_DATTR */
+    record<&cdgen::cb_rsrc_dattrC>,         /* STAGED_DATTR_C */
+    record<&cdgen::cb_rsrc_action>,         /* STAGED_ACTION */
+    record<&cdgen::cb_rsrc_actionC>,        /* STAGED_ACTION_C */
+    record<&cdgen::cb_sd_def>,              /* STAGED_SD_DEF */
+};
+
+/* By stanza_id. */
+constexpr void (*initialisers[])(cdgen &) = {
+    init_class_tbl,      /* SC_CONTROL_DEFINITION */
+    init_cmmap_tbl,      /* SC_CLASS_TO_MANAGER_MAPPING */
+    init_var_class_tbl,  /* SC_RESOURCE_VARIABLE_CLASS */
+    init_class_tbl_fake, /* SC_RESOURCE_CLASS */
+    init_pattr_tbl,      /* SC_PERSISTENT_RESOURCE_ATTRIBUTE */
+    init_pattrC_tbl,     /* SC_PERSISTENT_CLASS_ATTRIBUTE */
+    init_dattr_tbl,      /* SC_DYNAMIC_RESOURCE_ATTRIBUTE */
+    init_dattrC_tbl,     /* SC_DYNAMIC_CLASS_ATTRIBUTE */
+    init_actionC_tbl,    /* SC_CLASS_ACTION */
+    init_action_tbl,     /* SC_RESOURCE_ACTION */
+};
+static_assert(std::size(initialisers) == SC_PATTR_SD_DEFINITION, "init_sd_tbl opens all others");
+
+} // namespace
+
+char *sc_cb(cdgen &cx, const srtable_ctrl &kind) {
+    return records[kind.sc_record](cx);
+}
+
+void (*sc_init_tbl(const srtable_ctrl &kind))(cdgen &) {
+    auto id = static_cast<size_t>(&kind - sc_tables.data());
+    return id < std::size(initialisers) ? initialisers[id] : init_sd_tbl;
+}
+
+tbl *sc_str_tbl(cdgen &cx, const srtable_ctrl &kind) {
+    switch (kind.sc_side_tables) {
+    case TABLES_OF_CMMAP:
+        return staged_tbl(cx.cb_rsrc_cmmap.u_rcm_strings);
+    case TABLES_OF_VARIABLE_CLASS:
+        return staged_tbl(cx.cb_rsrc_variable_class.u_rvc_string_tbl);
+    default:
+        return staged_tbl(cx.cb_rsrc_class.u_rc_strings);
+    }
+}
+
+tbl *sc_vty_tbl(cdgen &cx, const srtable_ctrl &kind) {
+    return kind.sc_side_tables == TABLES_OF_CLASS ? staged_tbl(cx.cb_rsrc_class.u_rc_variety_lists) : nullptr;
+}
+
+tbl *sc_vv_tbl(cdgen &cx, const srtable_ctrl &kind) {
+    return kind.sc_side_tables == TABLES_OF_CLASS ? staged_tbl(cx.cb_rsrc_class.u_rc_valid_vals) : nullptr;
+}
+
+tbl *sc_sd_tbl(cdgen &cx, const srtable_ctrl &kind) {
+    return kind.sc_side_tables == TABLES_OF_CMMAP ? nullptr : staged_tbl(cx.cb_rsrc_class.u_rc_sd_defs);
+}
+
+vx_uint16_t &vv_found(cdgen &cx, const srtable_ctrl &kind) {
+    switch (kind.sc_record) {
+    case STAGED_PATTR:
+        return cx.pattr_vv_found;
+    case STAGED_PATTR_C:
+        return cx.pattrC_vv_found;
+    case STAGED_DATTR:
+        return cx.dattr_vv_found;
+    default:
+        return cx.dattrC_vv_found;
+    }
+}

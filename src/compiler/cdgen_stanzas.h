@@ -1,0 +1,23 @@
+/* cdgen_stanzas.h: where the compiler stages what the stanzas of a kind say. */
+#ifndef CDGEN_CDGEN_STANZAS_H
+#define CDGEN_CDGEN_STANZAS_H
+
+#include "compiler/cdgen.h"
+
+/* The kind's staging record. */
+char *sc_cb(cdgen &cx, const srtable_ctrl &kind);
+
+/* The function that opens the kind's staging record, after completing it if it is open. */
+void (*sc_init_tbl(const srtable_ctrl &kind))(cdgen &);
+
+/* The tables for the kind's strings, varieties, valid values and elements; null if it has none, or while the record
+ * that owns them has not been opened. */
+tbl *sc_str_tbl(cdgen &cx, const srtable_ctrl &kind);
+tbl *sc_vty_tbl(cdgen &cx, const srtable_ctrl &kind);
+tbl *sc_vv_tbl(cdgen &cx, const srtable_ctrl &kind);
+tbl *sc_sd_tbl(cdgen &cx, const srtable_ctrl &kind);
+
+/* For attribute kinds: whether the stanza already has its list of valid values. */
+vx_uint16_t &vv_found(cdgen &cx, const srtable_ctrl &kind);
+
+#endif

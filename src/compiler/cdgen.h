@@ -6,10 +6,10 @@
 #define CDGEN_CDGEN_H
 
 #include "cdb.h"
-#include "compiler/cdgen_catalogue.h"
 #include "compiler/cdgen_error.h"
 #include "compiler/cdgen_observer.h"
 #include "format/names.h"
+#include "language/catalogue.h"
 #include "language/limits.h"
 
 #include <array>

@@ -1,6 +1,6 @@
 /* catalogue.cpp: the source language as data: stanza kinds and their attributes. */
 
-#include "compiler/cdgen_catalogue.h"
+#include "language/catalogue.h"
 
 #include <cstddef>
 #include <cstring>

@@ -97,12 +97,12 @@ std::string_view breach(const difference &d) {
         return "readers miss it";
     if (d.what != change::changed)
         return {};
-    std::string_view field = d.before->field;
-    if (field == "ra_attr_id" || field == "ac_action_id")
+    const cdb::field_fact &what = *d.before->what;
+    if (what.is == cdb::role::NUMBER)
         return "readers know it by its number";
-    if (field == "ra_data_type" || field == "sd_field_type")
+    if (what.as == cdb::meaning::DATA_TYPE)
         return "values of another type";
-    if (field == "ElementIndex")
+    if (&what == &ELEMENT_INDEX)
         return "another layout of the structure";
     return {};
 }

@@ -1,9 +1,10 @@
 /* compare.h: what a database means, as a tree that can be compared: nothing of where things stand in the file, of its
  * byte order, or of when it was made. */
-#ifndef CDGEN_CDEF_DIFF_H
-#define CDGEN_CDEF_DIFF_H
+#ifndef CDGEN_COMPARE_H
+#define CDGEN_COMPARE_H
 
 #include "cdb_view.h"
+#include "format/facts.h"
 #include "reader/ownership.h"
 
 #include <array>
@@ -17,10 +18,12 @@ namespace cdef {
 
 /* One thing that is known of a record. */
 struct fact {
-    std::string_view field; /* of the record, as in cdb.h */
-    std::string_view label; /* in words */
-    std::string text;       /* printable */
+    const cdb::field_fact *what; /* outlives the fact */
+    std::string text;            /* printable */
 };
+
+/* The place of an element in its structure, which no field holds. */
+inline constexpr cdb::field_fact ELEMENT_INDEX = {.field = "ElementIndex", .words = "index"};
 
 /* A record, or an entry of a list, and what belongs to it. */
 struct thing {
@@ -29,10 +32,6 @@ struct thing {
     std::vector<fact> facts;
     std::vector<thing> parts;
 };
-
-/* A field that says where things stand in the file, how many or how long they are, and none of their contents; or when
- * the file was made. */
-bool is_layout(std::string_view field);
 
 /* The tables of a class that have a stanza for each record; those of attributes first. */
 enum class table : std::uint8_t {

@@ -1,7 +1,9 @@
 /* meaning.cpp: what a database means, as a tree. The fields of its records come from the field tables, so
  * that none is forgotten. */
 
+#include "compare/compare.h"
 #include "compare/fields.h"
+#include "format/sections.h"
 
 namespace cdef {
 
@@ -9,21 +11,9 @@ namespace {
 
 constexpr const char *VALID_VALUE = "valid value";
 
-/* A kind of record, and the names of the bits in its properties. */
-struct record_kind {
-    std::string_view name;
-    std::span<const props_t> properties;
-};
-
-/* By table. */
-constexpr record_kind kinds[RECORD_TABLES] = {
-    {"PersistentClassAttribute", pa_props},
-    {"DynamicClassAttribute", da_props},
-    {"PersistentResourceAttribute", pa_props},
-    {"DynamicResourceAttribute", da_props},
-    {"ClassAction", act_props},
-    {"ResourceAction", act_props},
-};
+template <class Record> const cdb::field_fact &fact_of(std::size_t offset) {
+    return cdb::format_for<Record>.fact_at(offset);
+}
 
 class builder {
 public:
@@ -34,15 +24,15 @@ public:
 
 private:
     template <class Record>
-    thing record(const record_kind &kind, const cdb::bytes &area, std::size_t at, const cdb::class_tables &tables);
-    void add_number(thing &to, const record_kind &kind, const cdb::field &f, std::uint32_t number);
-    void add_text(thing &to, const cdb::field &f, std::string_view text);
-    void add_reference(thing &to, const cdb::field &f, const cdb_ref_t &ref, const cdb::class_tables &tables,
-                       vx_data_type_t type);
-    void add_value(thing &to, const cdb::field &f, const cdb::value &value, bool is_own, const cdb::bytes &strings);
+    thing record(std::string_view kind, const cdb::bytes &area, std::size_t at, const cdb::class_tables &tables);
+    void add_text(thing &to, const cdb::field_fact &what, std::string_view text);
+    void add_reference(thing &to, const cdb::field &f, const cdb::field_fact &what, const cdb_ref_t &ref,
+                       const cdb::class_tables &tables, vx_data_type_t type);
+    void add_value(thing &to, const cdb::field_fact &what, const cdb::value &value, bool is_own,
+                   const cdb::bytes &strings);
     void add_varieties(thing &to, const cdb::variety_list &varieties);
     void add_valid_values(thing &to, const cdb::valid_value_list &values, const cdb::class_tables &tables);
-    void add_elements(thing &to, const cdb::field &f, const cdb_ref_t &ref, const cdb::class_tables &tables);
+    void add_elements(thing &to, const cdb::field_fact &what, const cdb_ref_t &ref, const cdb::class_tables &tables);
     template <class Record>
     void add_records(thing &to, table from, const cdb::class_tables &tables, const cdb_ref_t &first, std::size_t count);
     void add_errors(thing &to, const rsrc_class_t &rc, const cdb::class_tables &tables);
@@ -57,25 +47,22 @@ private:
     teller tell;
 };
 
-void builder::add_number(thing &to, const record_kind &kind, const cdb::field &f, std::uint32_t number) {
-    bool properties = f.name.ends_with("_props");
-    field_label words = label_of(f);
-    to.facts.push_back({f.name, properties ? "properties" : words.words,
-                        properties ? text_of_bits(number, kind.properties) : text_of_number(number, words.as)});
+void add_number(thing &to, const cdb::field_fact &what, std::uint32_t number) {
+    to.facts.push_back({&what, text_of_number(number, what.as)});
 }
 
-void builder::add_text(thing &to, const cdb::field &f, std::string_view text) {
-    if (is_name(f))
+void builder::add_text(thing &to, const cdb::field_fact &what, std::string_view text) {
+    if (what.is == cdb::role::NAME)
         to.name = tell.text_of(text);
     else
-        to.facts.push_back({f.name, label_of(f).words, text.empty() ? "nothing" : tell.text_of(text)});
+        to.facts.push_back({&what, text.empty() ? "nothing" : tell.text_of(text)});
 }
 
-void builder::add_value(thing &to, const cdb::field &f, const cdb::value &value, bool is_own,
+void builder::add_value(thing &to, const cdb::field_fact &what, const cdb::value &value, bool is_own,
                         const cdb::bytes &strings) {
-    bool bound = f.name == "ra_min_value" || f.name == "ra_max_value";
+    bool bound = what.as == cdb::meaning::BOUND;
     std::string text = bound ? tell.text_of_bound(value, is_own, strings, owners) : tell.text_of(value, strings);
-    to.facts.push_back({f.name, label_of(f).words, std::move(text)});
+    to.facts.push_back({&what, std::move(text)});
 }
 
 void builder::add_varieties(thing &to, const cdb::variety_list &varieties) {
@@ -90,36 +77,36 @@ void builder::add_valid_values(thing &to, const cdb::valid_value_list &values, c
         if (text != high)
             text.append(" to ").append(high);
         thing entry = {VALID_VALUE, text, {}, {}};
-        entry.facts.push_back({"vv_disp_msgid", "display name", std::to_string(v.message)});
+        entry.facts.push_back({&fact_of<vv_entry_t>(offsetof(vv_entry_t, vv_disp_msgid)), std::to_string(v.message)});
         to.parts.push_back(std::move(entry));
     }
 }
 
 /* An element's place in the structure is part of what it means. */
-void builder::add_elements(thing &to, const cdb::field &f, const cdb_ref_t &ref, const cdb::class_tables &tables) {
+void builder::add_elements(thing &to, const cdb::field_fact &what, const cdb_ref_t &ref,
+                           const cdb::class_tables &tables) {
     std::size_t count = cdb::sd_definition_at(tables, ref).size();
     std::size_t at = ref.offset[0] + offsetof(sd_def_t, sd_fields);
     for (std::size_t i = 0; i < count; ++i, at += sizeof(sd_field_t)) {
-        record_kind kind = {label_of(f).words, {}};
-        thing element = record<sd_field_t>(kind, tables.sd_defs, at, tables);
-        element.facts.insert(element.facts.begin(), {"ElementIndex", "index", std::to_string(i)});
+        thing element = record<sd_field_t>(what.label(), tables.sd_defs, at, tables);
+        element.facts.insert(element.facts.begin(), {&ELEMENT_INDEX, std::to_string(i)});
         to.parts.push_back(std::move(element));
     }
 }
 
-void builder::add_reference(thing &to, const cdb::field &f, const cdb_ref_t &ref, const cdb::class_tables &tables,
-                            vx_data_type_t type) {
-    if (label_of(f).as == form::reference || f.to == cdb::target::section || f.to == cdb::target::none)
-        return add_number(to, {}, f, ref.offset[0]);
+void builder::add_reference(thing &to, const cdb::field &f, const cdb::field_fact &what, const cdb_ref_t &ref,
+                            const cdb::class_tables &tables, vx_data_type_t type) {
+    if (what.as == cdb::meaning::UNUSED)
+        return add_number(to, what, ref.offset[0]);
     switch (f.to) {
     case cdb::target::strings:
-        return add_text(to, f, tables.strings.text(ref));
+        return add_text(to, what, tables.strings.text(ref));
     case cdb::target::variety_lists:
         return add_varieties(to, cdb::varieties_at(tables, ref));
     case cdb::target::valid_vals:
         return add_valid_values(to, cdb::valid_values_at(tables, ref, type), tables);
     default: /* definitions */
-        return add_elements(to, f, ref, tables);
+        return add_elements(to, what, ref, tables);
     }
 }
 
@@ -140,23 +127,25 @@ template <class Field> Field load(const std::byte *from) {
 }
 
 template <class Record>
-thing builder::record(const record_kind &kind, const cdb::bytes &area, std::size_t at,
-                      const cdb::class_tables &tables) {
+thing builder::record(std::string_view kind, const cdb::bytes &area, std::size_t at, const cdb::class_tables &tables) {
     auto copy = area.record<Record>(at);
     const auto *bytes = reinterpret_cast<const std::byte *>(&copy);
     vx_data_type_t type = type_of(copy);
-    thing made = {std::string(kind.name), {}, {}, {}};
-    for (const cdb::field &f : cdb::fields_of<Record>) {
+    thing made = {std::string(kind), {}, {}, {}};
+    const cdb::record_format &format = cdb::format_for<Record>;
+    for (std::size_t i = 0; i < format.fields.size(); ++i) {
+        const cdb::field &f = format.fields[i];
+        const cdb::field_fact &what = format.facts[i];
         const std::byte *from = bytes + f.offset;
         bool is_own = owners.is_own(area, at + f.offset);
-        if (is_layout(f.name) || (f.to == cdb::target::valid_vals && !is_own))
+        if (what.is == cdb::role::LAYOUT || (f.to == cdb::target::valid_vals && !is_own))
             continue;
         if (f.kind == cdb::field_kind::number)
-            add_number(made, kind, f, f.width == 2 ? load<std::uint16_t>(from) : load<std::uint32_t>(from));
+            add_number(made, what, f.width == 2 ? load<std::uint16_t>(from) : load<std::uint32_t>(from));
         else if (f.kind == cdb::field_kind::reference)
-            add_reference(made, f, load<cdb_ref_t>(from), tables, type);
+            add_reference(made, f, what, load<cdb_ref_t>(from), tables, type);
         else if (f.kind == cdb::field_kind::value)
-            add_value(made, f, {area, at + f.offset, type, tables.strings}, is_own, tables.strings);
+            add_value(made, what, {area, at + f.offset, type, tables.strings}, is_own, tables.strings);
     }
     return made;
 }
@@ -166,7 +155,8 @@ void builder::add_records(thing &to, table from, const cdb::class_tables &tables
                           std::size_t count) {
     std::size_t at = first.offset[0];
     for (std::size_t i = 0; i < count; ++i, at += sizeof(Record))
-        to.parts.push_back(record<Record>(kinds[static_cast<std::size_t>(from)], tables.section, at, tables));
+        to.parts.push_back(
+            record<Record>(cdb::side_tables[static_cast<std::size_t>(from)].stanza, tables.section, at, tables));
 }
 
 /* A table of errors or dependencies whose place is 0, where the class stands, has no place: nothing can be known of it
@@ -180,14 +170,14 @@ void builder::add_errors(thing &to, const rsrc_class_t &rc, const cdb::class_tab
     std::size_t at = rc.u_rc_errors.offset[0];
     std::size_t count = count_placed<rsrc_error_t>(tables.section, rc.u_rc_errors, rc.rc_num_errors);
     for (std::size_t i = 0; i < count; ++i, at += sizeof(rsrc_error_t))
-        to.parts.push_back(record<rsrc_error_t>({"error", {}}, tables.section, at, tables));
+        to.parts.push_back(record<rsrc_error_t>("error", tables.section, at, tables));
 }
 
 void builder::add_dependencies(thing &to, const rsrc_class_t &rc, const cdb::bytes &section) {
     std::size_t at = rc.u_rc_depends.offset[0];
     std::size_t count = count_placed<rsrc_depend_t>(section, rc.u_rc_depends, rc.rc_num_depends);
     for (std::size_t i = 0; i < count; ++i, at += sizeof(rsrc_depend_t)) {
-        to.parts.push_back(record<rsrc_depend_t>({"dependency", {}}, section, at, {}));
+        to.parts.push_back(record<rsrc_depend_t>("dependency", section, at, {}));
         to.parts.back().name = std::to_string(section.record<rsrc_depend_t>(at).rd_class_ID);
     }
 }
@@ -195,13 +185,14 @@ void builder::add_dependencies(thing &to, const rsrc_class_t &rc, const cdb::byt
 /* The heads and links of its chains are places. So are the references to classes: they have no base that is known. */
 thing builder::class_hash(const cdb::bytes &section) {
     thing made = {"class hash", {}, {}, {}};
-    made.facts.push_back({"rch_cb_ID", "rch_cb_ID", std::to_string(section.number<std::uint32_t>(0))});
+    add_number(made, fact_of<rsrc_class_hash_t>(offsetof(rsrc_class_hash_t, rch_cb_ID)),
+               section.number<std::uint32_t>(0));
     std::size_t at = offsetof(rsrc_class_hash_t, rc_hash_blocks);
     std::size_t count =
         cdb::count_inside(section, at, section.number<std::uint32_t>(offsetof(rsrc_class_hash_t, rch_num_hash_blocks)),
                           sizeof(rc_hash_block_t));
     for (std::size_t i = 0; i < count; ++i, at += sizeof(rc_hash_block_t)) {
-        made.parts.push_back(record<rc_hash_block_t>({"block", {}}, section, at, {}));
+        made.parts.push_back(record<rc_hash_block_t>("block", section, at, {}));
         made.parts.back().name = std::to_string(section.record<rc_hash_block_t>(at).rch_class_id);
     }
     return made;
@@ -211,7 +202,7 @@ thing builder::resource_class(const cdb::bytes &section) {
     cdb::resource_class view(section);
     const rsrc_class_t &rc = view.record();
     const cdb::class_tables &tables = view.side_tables();
-    thing made = record<rsrc_class_t>({"ResourceClass", rc_props}, section, 0, tables);
+    thing made = record<rsrc_class_t>("ResourceClass", section, 0, tables);
     add_records<rsrc_pattr_t>(made, table::persistent_attributes, tables, rc.u_rc_pattrs, rc.rc_num_pattrs);
     add_records<rsrc_pattr_t>(made, table::persistent_class_attributes, tables, rc.u_rc_pattrsC, rc.rc_num_pattrsC);
     add_records<rsrc_dattr_t>(made, table::dynamic_attributes, tables, rc.u_rc_dattrs, rc.rc_num_dattrs);
@@ -227,7 +218,7 @@ thing builder::variable_class(const cdb::bytes &section) {
     cdb::variable_class view(section);
     cdb::class_tables tables;
     tables.strings = section.part(sizeof(rsrc_variable_class_t), view.record().u_rvc_string_tbl.offset[0]);
-    thing made = record<rsrc_variable_class_t>({"ResourceVariableClass", {}}, section, 0, tables);
+    thing made = record<rsrc_variable_class_t>("ResourceVariableClass", section, 0, tables);
     for (const cdb::variable_id &id : view.variable_ids())
         made.parts.push_back({id.of_class() ? "class variable" : "variable",
                               std::to_string(id.number & ~(id.of_class() ? VAR_ID_CLASS_ATTR : 0)),
@@ -247,10 +238,10 @@ thing builder::section(std::size_t index) {
         return variable_class(bytes);
     case CDB_DSECT_RSRC_MGR:
         tables.strings = bytes.part(sizeof(rsrc_mgr_t));
-        return record<rsrc_mgr_t>({"ResourceManager", {}}, bytes, 0, tables);
+        return record<rsrc_mgr_t>("ResourceManager", bytes, 0, tables);
     case CDB_DSECT_CMMAP:
         tables.strings = bytes.part(bytes.record<rsrc_cmmap_t>(0).u_rcm_strings.offset[0]);
-        return record<rsrc_cmmap_t>({"ClassToManagerMapping", {}}, bytes, 0, tables);
+        return record<rsrc_cmmap_t>("ClassToManagerMapping", bytes, 0, tables);
     case CDB_DSECT_CLASS_HASH:
         return class_hash(bytes);
     case CDB_DSECT_UNUSED:
@@ -262,10 +253,11 @@ thing builder::section(std::size_t index) {
 }
 
 thing builder::whole() {
-    thing made = record<orb_cdb_header_t>({"database", {}}, db.file(), 0, {});
+    thing made = record<orb_cdb_header_t>("database", db.file(), 0, {});
     for (std::size_t i = 0; i < db.section_count(); ++i) {
         made.parts.push_back(section(i));
-        made.parts.back().facts.push_back({"cda_revision", "revision", std::to_string(db.anchor(i).cda_revision)});
+        add_number(made.parts.back(), fact_of<cdb_dsect_anchor_t>(offsetof(cdb_dsect_anchor_t, cda_revision)),
+                   db.anchor(i).cda_revision);
     }
     return made;
 }

@@ -4,6 +4,7 @@
 #define CDGEN_FORMAT_FACTS_H
 
 #include "cdb_fields.h"
+#include "format/names.h"
 
 #include <algorithm>
 #include <optional>
@@ -57,6 +58,22 @@ struct field_fact {
         return words.empty() ? field : words;
     }
 };
+
+/* The names of the bits in a field of properties; none for any other field. */
+constexpr std::span<const props_t> properties_of(meaning as) {
+    switch (as) {
+    case meaning::CLASS_PROPERTIES:
+        return rc_props;
+    case meaning::PERSISTENT_PROPERTIES:
+        return pa_props;
+    case meaning::DYNAMIC_PROPERTIES:
+        return da_props;
+    case meaning::ACTION_PROPERTIES:
+        return act_props;
+    default:
+        return {};
+    }
+}
 
 /* ---- How rows are made ----------------------------------------------------------------------------------------- */
 

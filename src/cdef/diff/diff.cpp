@@ -53,7 +53,7 @@ std::string line_of(const difference &d, bool one_class, bool with_reason) {
         line += (std::exchange(first, false) ? "" : ", ") + t->kind + (t->name.empty() ? "" : " ") + t->name;
     }
     if (d.what == change::changed)
-        line += ": " + std::string(d.before->label) + " " + d.before->text + " -> " + d.after->text;
+        line += ": " + std::string(d.before->what->label()) + " " + d.before->text + " -> " + d.after->text;
     if (with_reason)
         line += " (" + std::string(breach(d)) + ")";
     return line + "\n";
@@ -70,7 +70,7 @@ json json_of(const difference &d) {
         data["path"].push_back(std::move(entry));
     }
     if (d.what == change::changed) {
-        data["field"] = d.before->field;
+        data["field"] = d.before->what->field;
         data["before"] = d.before->text;
         data["after"] = d.after->text;
     }

@@ -118,13 +118,10 @@ fact fact_of(cdb::meaning as, std::uint32_t number) {
     case SECTION_TYPE:
         return section_type(number);
     case CLASS_PROPERTIES:
-        return properties(rc_props, number);
     case PERSISTENT_PROPERTIES:
-        return properties(pa_props, number);
     case DYNAMIC_PROPERTIES:
-        return properties(da_props, number);
     case ACTION_PROPERTIES:
-        return properties(act_props, number);
+        return properties(cdb::properties_of(as), number);
     case PERMISSIONS:
         return permissions(number);
     case DATA_TYPE:

@@ -2,41 +2,12 @@
 
 #include "cdef/source/source.h"
 #include "cdef/support/trouble.h"
-#include "compare/compare.h"
+#include "format/records.h"
 #include "text/shown.h"
 
 namespace cdef {
 
 namespace {
-
-/* What the stanzas say of a record; and what hangs on their number and order. */
-constexpr std::string_view written[] = {
-    "rc_props",           "u_rc_name",         "u_rc_def_input",      "u_rc_undef_input",  "u_rc_online_input",
-    "u_rc_offline_input", "u_rc_reset_input",  "rc_perm_temp",        "rc_perm_tempC",     "rc_dscr_msgid",
-    "rc_disp_msgid",      "rc_locator",        "rc_version",          "ra_props",          "u_ra_name",
-    "ra_dscr_msgid",      "ra_disp_msgid",     "ra_group_msgid",      "ra_group_id",       "ra_attr_id",
-    "ra_data_type",       "u_ra_variety_list", "u_ra_valid_vals",     "u_ra_sd",           "ra_max_sd_idx",
-    "u_ra_express",       "u_ra_rearm_expr",   "ra_var_type",         "ra_expr_desc",      "ra_rearm_desc",
-    "ac_action_id",       "ac_props",          "ac_dscr_msgid",       "ac_disp_msgid",     "ac_confirm_msgid",
-    "ac_timeout",         "ac_perms",          "u_ac_name",           "u_ac_variety_list", "u_ac_sd_input",
-    "u_ac_sd_resp",       "u_sd_field_name",   "sd_field_type",       "sd_disp_msgid",     "sd_dscr_msgid",
-    "u_sd_valid_vals",    "u_rm_RMname",       "u_rcm_msg_file",      "rcm_dscr_msg_set",  "rcm_first_key",
-    "rcm_last_key",       "rvc_obsv_interval", "rvc_report_interval", "u_rvc_name",        "u_rvc_compat_name",
-};
-
-/* Fields that the compiler gives another value than 0, always the same. */
-struct constant {
-    std::string_view field;
-    std::uint32_t value;
-};
-constexpr constant constants[] = {{"sd_action_id", 65535}, {"sd_valid_type", 1}, {"u_rc_alias", CDB_NONE}};
-
-std::uint32_t constant_of(std::string_view field) {
-    for (const constant &c : constants)
-        if (c.field == field)
-            return c.value;
-    return 0;
-}
 
 std::uint32_t number_at(const std::byte *from, std::size_t width) {
     std::uint16_t half = 0;
@@ -47,16 +18,22 @@ std::uint32_t number_at(const std::byte *from, std::size_t width) {
     return width == sizeof half ? half : whole;
 }
 
-/* Every field that nothing writes has the one value that the compiler gives it. */
+/* True if the field holds whatever the source's lines, or their number and order, lead to. */
+bool depends_on_source(const cdb::field_fact &what) {
+    return what.is == cdb::role::LAYOUT || (!what.lines.empty() && !what.always);
+}
+
+/* Every other field has the one value that the compiler gives it. */
 template <class Record> void require_plain(const Record &record, const std::string &place) {
     const auto *bytes = reinterpret_cast<const std::byte *>(&record);
-    for (const cdb::field &f : cdb::fields_of<Record>) {
-        if (f.kind != cdb::field_kind::number && f.kind != cdb::field_kind::reference)
-            continue;
-        if (is_layout(f.name) || std::find(std::begin(written), std::end(written), f.name) != std::end(written))
+    const cdb::record_format &format = cdb::format_for<Record>;
+    for (std::size_t i = 0; i < format.fields.size(); ++i) {
+        const cdb::field &f = format.fields[i];
+        bool is_number = f.kind == cdb::field_kind::number || f.kind == cdb::field_kind::reference;
+        if (!is_number || depends_on_source(format.facts[i]))
             continue;
         std::uint32_t found = number_at(bytes + f.offset, f.width);
-        if (found != constant_of(f.name))
+        if (found != format.facts[i].always.value_or(0))
             no_source(place, "no line sets " + std::string(f.name) + " to " + std::to_string(found));
     }
 }

@@ -54,7 +54,8 @@ foreach(program IN LISTS programs)
 endforeach()
 install(FILES man/cdefsrc.5 man/cdef.5 DESTINATION "${CMAKE_INSTALL_MANDIR}/man5")
 install(FILES README.md CHANGELOG.md CONTRIBUTING.md LICENSE SECURITY.md DESTINATION "${CMAKE_INSTALL_DOCDIR}")
-install(DIRECTORY docs examples DESTINATION "${CMAKE_INSTALL_DOCDIR}")
+install(DIRECTORY docs examples DESTINATION "${CMAKE_INSTALL_DOCDIR}"
+  PATTERN Doxyfile EXCLUDE PATTERN mkdocs.yml EXCLUDE)
 
 # Links of the documents to ../include lead to the headers.
 file(RELATIVE_PATH headers_of_docs "${CMAKE_INSTALL_FULL_DOCDIR}" "${CMAKE_INSTALL_FULL_INCLUDEDIR}/cdgen")

@@ -1,9 +1,10 @@
-/*
- * cdb_fields.h: the fields of every record of a class definition database as data, one table a record: what stands
- * where, and what becomes of it when a file is turned into the other byte order. Reversal, inspection and verification
- * walk these tables. C++20.
+/**
+ * @file
+ * The fields of every record of a class definition database as data, one table for each record: where a field is, what
+ * it holds, and what becomes of it when a file is reversed to the other byte order. Reversal, inspection and
+ * verification loop over these tables. C++20.
  *
- * Each table covers its record without gap or overlap; that is checked while compiling.
+ * Each table covers its record without gap or overlap, which is checked while compiling.
  */
 #ifndef CDGEN_CDB_FIELDS_H
 #define CDGEN_CDB_FIELDS_H
@@ -19,44 +20,47 @@
 
 namespace cdb {
 
+/** What a field holds, and so what becomes of it in the other byte order. */
 enum class field_kind : std::uint8_t {
-    number,    /* turned whole, each of count */
-    reference, /* cdb_ref_t: its first word is turned */
-    value,     /* vx_value_t: turned by its data type, with what it refers to */
-    reserved,  /* 0, and left as it is */
-    entries    /* the first of a list's entries, which have a table of their own */
+    number,    /**< a number, or count of them: reversed whole */
+    reference, /**< a cdb_ref_t: its first word is reversed */
+    value,     /**< a vx_value_t: reversed by its data type, with what it refers to */
+    reserved,  /**< 0, and left as it is */
+    entries    /**< the first entry of a list; entries have a table of their own */
 };
 
-/* Which of the class's tables (or, for maps, managers and variable classes, of the section's) an offset counts in. */
+/** The table of the class that an offset counts from; for managers, maps and variable classes, of the section. */
 enum class target : std::uint8_t { none, strings, variety_lists, valid_vals, sd_defs, section };
 
-/* For a value's type_at: the record does not know the type, its owner does. */
+/** For type_at of a value: the data type is not in the record, but in the record that refers to it. */
 inline constexpr std::uint16_t TYPE_OF_OWNER = 0xFFFF;
 
+/** One field of a record. */
 struct field {
-    std::string_view name;
-    std::uint16_t offset; /* bytes from the start of the record */
-    std::uint16_t width;  /* bytes, of one */
-    std::uint16_t count;  /* 1, or of an array */
-    field_kind kind;
-    target to = target::none;              /* references */
-    std::uint16_t type_at = TYPE_OF_OWNER; /* values: offset of the field that holds the data type */
-    bool stays = false;                    /* an exception: left as it is in a turned file */
-    bool optional = false;                 /* references: may be none */
+    std::string_view name;                 /**< as in cdb.h; of a member of a member with a point between them */
+    std::uint16_t offset;                  /**< bytes from the start of the record */
+    std::uint16_t width;                   /**< bytes of one element */
+    std::uint16_t count;                   /**< number of elements; 1 unless it is an array */
+    field_kind kind;                       /**< what it holds */
+    target to = target::none;              /**< for references */
+    std::uint16_t type_at = TYPE_OF_OWNER; /**< for values: offset of the field that holds the data type */
+    bool stays = false;                    /**< true: not reversed, whatever its kind */
+    bool optional = false;                 /**< true: the reference may be none */
 };
 
-/* A row that is left as it is. */
+/** The row, marked as not reversed. */
 consteval field stays(field row) {
     row.stays = true;
     return row;
 }
 
-/* A reference that may be none. */
+/** The row, marked as a reference that may be none. */
 consteval field or_none(field row) {
     row.optional = true;
     return row;
 }
 
+/** True if the fields cover a record of so many bytes, in order, without gap or overlap. */
 consteval bool tiles(std::span<const field> fields, std::size_t size) {
     std::size_t at = 0;
     for (const field &f : fields) {
@@ -67,7 +71,7 @@ consteval bool tiles(std::span<const field> fields, std::size_t size) {
     return at == size;
 }
 
-/* The row of a member, from its declaration. */
+/** The row of a member, from its declaration. */
 #define CDB_ROW(record, member, ...)                                                                                   \
     ::cdb::field {                                                                                                     \
 #member, offsetof(record, member),                                                                             \
@@ -77,14 +81,18 @@ consteval bool tiles(std::span<const field> fields, std::size_t size) {
                     std::remove_all_extents_t <std::remove_reference_t <decltype(std::declval <record &>().member)>>), \
             __VA_ARGS__                                                                                                \
     }
+/** The row of a member that is not a reference or a value. */
 #define CDB_FIELD(record, member, kind) CDB_ROW(record, member, ::cdb::field_kind::kind)
+/** The row of a reference, and the table that it leads into. */
 #define CDB_REF(record, member, to) CDB_ROW(record, member, ::cdb::field_kind::reference, ::cdb::target::to)
+/** The row of a value, and the offset of the field that holds its type. */
 #define CDB_VALUE(record, member, type_at)                                                                             \
     CDB_ROW(record, member, ::cdb::field_kind::value, ::cdb::target::strings, type_at)
 
+/** The fields of orb_cdb_header_t. */
 inline constexpr field cdb_header_fields[] = {
     CDB_FIELD(orb_cdb_header_t, cdb_hdr_length, number),
-    stays(CDB_FIELD(orb_cdb_header_t, cdb_hdr_checksum, number)), /* computed anew over the turned file */
+    stays(CDB_FIELD(orb_cdb_header_t, cdb_hdr_checksum, number)), /* computed again over the reversed file */
     CDB_FIELD(orb_cdb_header_t, cdb_hdr_format, number),
     CDB_FIELD(orb_cdb_header_t, cdb_hdr_seqno, number),
     CDB_FIELD(orb_cdb_header_t, cdb_hdr_timestamp.tv_sec, number),
@@ -105,6 +113,7 @@ inline constexpr field cdb_header_fields[] = {
 };
 static_assert(tiles(cdb_header_fields, sizeof(orb_cdb_header_t)));
 
+/** The fields of cdb_dsect_anchor_t. */
 inline constexpr field cdb_dsect_anchor_fields[] = {
     CDB_FIELD(cdb_dsect_anchor_t, cda_type, number),
     CDB_FIELD(cdb_dsect_anchor_t, cda_offset, number),
@@ -113,6 +122,7 @@ inline constexpr field cdb_dsect_anchor_fields[] = {
 };
 static_assert(tiles(cdb_dsect_anchor_fields, sizeof(cdb_dsect_anchor_t)));
 
+/** The fields of rsrc_class_t. */
 inline constexpr field class_fields[] = {
     CDB_FIELD(rsrc_class_t, rc_cb_ID, number),
     CDB_FIELD(rsrc_class_t, rc_props, number),
@@ -159,6 +169,7 @@ inline constexpr field class_fields[] = {
 };
 static_assert(tiles(class_fields, sizeof(rsrc_class_t)));
 
+/** The fields of rsrc_pattr_t. */
 inline constexpr field pattr_fields[] = {
     CDB_FIELD(rsrc_pattr_t, ra_cb_ID, number),
     CDB_FIELD(rsrc_pattr_t, ra_props, number),
@@ -178,6 +189,7 @@ inline constexpr field pattr_fields[] = {
 };
 static_assert(tiles(pattr_fields, sizeof(rsrc_pattr_t)));
 
+/** The fields of rsrc_dattr_t. */
 inline constexpr field dattr_fields[] = {
     CDB_FIELD(rsrc_dattr_t, ra_cb_ID, number),
     CDB_FIELD(rsrc_dattr_t, ra_props, number),
@@ -204,11 +216,12 @@ inline constexpr field dattr_fields[] = {
     CDB_FIELD(rsrc_dattr_t, ra_expr_desc, number),
     CDB_FIELD(rsrc_dattr_t, ra_rearm_desc, number),
     CDB_FIELD(rsrc_dattr_t, ra_range_desc, number),
-    stays(CDB_FIELD(rsrc_dattr_t, ra_report_interval, number)), /* deliberate */
+    stays(CDB_FIELD(rsrc_dattr_t, ra_report_interval, number)), /**< deliberate */
     CDB_FIELD(rsrc_dattr_t, ra_reserved, reserved),
 };
 static_assert(tiles(dattr_fields, sizeof(rsrc_dattr_t)));
 
+/** The fields of rsrc_action_t. */
 inline constexpr field action_fields[] = {
     CDB_FIELD(rsrc_action_t, ac_cb_ID, number),
     CDB_FIELD(rsrc_action_t, ac_action_id, number),
@@ -225,6 +238,7 @@ inline constexpr field action_fields[] = {
 };
 static_assert(tiles(action_fields, sizeof(rsrc_action_t)));
 
+/** The fields of rsrc_error_t. */
 inline constexpr field error_fields[] = {
     CDB_FIELD(rsrc_error_t, re_cb_ID, number),
     CDB_FIELD(rsrc_error_t, re_error_id, number),
@@ -239,6 +253,7 @@ inline constexpr field error_fields[] = {
 };
 static_assert(tiles(error_fields, sizeof(rsrc_error_t)));
 
+/** The fields of rsrc_depend_t. */
 inline constexpr field depend_fields[] = {
     CDB_FIELD(rsrc_depend_t, rd_cb_ID, number),
     CDB_FIELD(rsrc_depend_t, rd_class_ID, number),
@@ -246,12 +261,14 @@ inline constexpr field depend_fields[] = {
 };
 static_assert(tiles(depend_fields, sizeof(rsrc_depend_t)));
 
+/** The fields of vl_entry_t. */
 inline constexpr field vl_entry_fields[] = {
     CDB_FIELD(vl_entry_t, vl_low_val, number),
     CDB_FIELD(vl_entry_t, vl_high_val, number),
 };
 static_assert(tiles(vl_entry_fields, sizeof(vl_entry_t)));
 
+/** The fields of variety_list_t. */
 inline constexpr field variety_list_fields[] = {
     CDB_FIELD(variety_list_t, vl_cb_ID, number),
     CDB_FIELD(variety_list_t, vl_count, number),
@@ -259,6 +276,7 @@ inline constexpr field variety_list_fields[] = {
 };
 static_assert(tiles(variety_list_fields, sizeof(variety_list_t)));
 
+/** The fields of vv_entry_t. */
 inline constexpr field vv_entry_fields[] = {
     CDB_VALUE(vv_entry_t, vv_low_val, TYPE_OF_OWNER),
     CDB_VALUE(vv_entry_t, vv_high_val, TYPE_OF_OWNER),
@@ -267,6 +285,7 @@ inline constexpr field vv_entry_fields[] = {
 };
 static_assert(tiles(vv_entry_fields, sizeof(vv_entry_t)));
 
+/** The fields of valid_values_t. */
 inline constexpr field valid_values_fields[] = {
     CDB_FIELD(valid_values_t, vv_cb_ID, number),
     CDB_FIELD(valid_values_t, vv_count, number),
@@ -274,6 +293,7 @@ inline constexpr field valid_values_fields[] = {
 };
 static_assert(tiles(valid_values_fields, sizeof(valid_values_t)));
 
+/** The fields of sd_field_t. */
 inline constexpr field sd_field_fields[] = {
     CDB_REF(sd_field_t, u_sd_field_name, strings),
     CDB_FIELD(sd_field_t, sd_field_type, number),
@@ -286,6 +306,7 @@ inline constexpr field sd_field_fields[] = {
 };
 static_assert(tiles(sd_field_fields, sizeof(sd_field_t)));
 
+/** The fields of sd_def_t. */
 inline constexpr field sd_def_fields[] = {
     CDB_FIELD(sd_def_t, sd_cb_ID, number),
     CDB_FIELD(sd_def_t, sd_count, number),
@@ -293,6 +314,7 @@ inline constexpr field sd_def_fields[] = {
 };
 static_assert(tiles(sd_def_fields, sizeof(sd_def_t)));
 
+/** The fields of sbs_field_t. */
 inline constexpr field sbs_field_fields[] = {
     CDB_REF(sbs_field_t, u_sb_field_name, strings),      CDB_FIELD(sbs_field_t, sb_field_type, number),
     CDB_FIELD(sbs_field_t, sb_disp_msgid, number),       CDB_FIELD(sbs_field_t, sb_dscr_msgid, number),
@@ -300,6 +322,7 @@ inline constexpr field sbs_field_fields[] = {
 };
 static_assert(tiles(sbs_field_fields, sizeof(sbs_field_t)));
 
+/** The fields of sbs_def_t. */
 inline constexpr field sbs_def_fields[] = {
     CDB_FIELD(sbs_def_t, sb_cb_ID, number),
     CDB_FIELD(sbs_def_t, sb_count, number),
@@ -308,15 +331,17 @@ inline constexpr field sbs_def_fields[] = {
 };
 static_assert(tiles(sbs_def_fields, sizeof(sbs_def_t)));
 
+/** The fields of rsrc_mgr_t. */
 inline constexpr field mgr_fields[] = {
     CDB_FIELD(rsrc_mgr_t, rm_cb_ID, number),
     CDB_FIELD(rsrc_mgr_t, rm_id, number),
     CDB_FIELD(rsrc_mgr_t, rm_spare, number),
     CDB_REF(rsrc_mgr_t, u_rm_RMname, strings),
-    stays(CDB_REF(rsrc_mgr_t, u_rm_strings_table, none)), /* deliberate */
+    stays(CDB_REF(rsrc_mgr_t, u_rm_strings_table, none)), /**< deliberate */
 };
 static_assert(tiles(mgr_fields, sizeof(rsrc_mgr_t)));
 
+/** The fields of rsrc_cmmap_t. */
 inline constexpr field cmmap_fields[] = {
     CDB_FIELD(rsrc_cmmap_t, rcm_cb_ID, number),
     CDB_FIELD(rsrc_cmmap_t, rcm_class_ID, number),
@@ -339,6 +364,7 @@ inline constexpr field cmmap_fields[] = {
 };
 static_assert(tiles(cmmap_fields, sizeof(rsrc_cmmap_t)));
 
+/** The fields of rsrc_variable_class_t. */
 inline constexpr field variable_class_fields[] = {
     CDB_FIELD(rsrc_variable_class_t, rvc_cb_ID, number),
     CDB_FIELD(rsrc_variable_class_t, rvc_obsv_interval, number),
@@ -351,6 +377,7 @@ inline constexpr field variable_class_fields[] = {
 };
 static_assert(tiles(variable_class_fields, sizeof(rsrc_variable_class_t)));
 
+/** The fields of rc_hash_block_t. */
 inline constexpr field rc_hash_block_fields[] = {
     CDB_REF(rc_hash_block_t, u_rch_next_hash, none),
     CDB_FIELD(rc_hash_block_t, rch_prim_hash_value, number),
@@ -359,15 +386,17 @@ inline constexpr field rc_hash_block_fields[] = {
 };
 static_assert(tiles(rc_hash_block_fields, sizeof(rc_hash_block_t)));
 
+/** The fields of rsrc_class_hash_t. */
 inline constexpr field class_hash_fields[] = {
     CDB_FIELD(rsrc_class_hash_t, rch_cb_ID, number),
-    stays(CDB_REF(rsrc_class_hash_t, u_rch_table, none)), /* deliberate */
+    stays(CDB_REF(rsrc_class_hash_t, u_rch_table, none)), /**< deliberate */
     CDB_FIELD(rsrc_class_hash_t, rch_num_hash_blocks, number),
     CDB_FIELD(rsrc_class_hash_t, rc_hash_blocks, entries),
 };
 static_assert(tiles(class_hash_fields, sizeof(rsrc_class_hash_t)));
 
-/* Of its union's members, one is an offset: turned as such, though nothing turns a template. */
+/** The fields of ctx_tmplt_t. One member of the union is an offset, so the union is treated as one. No file holds one.
+ */
 inline constexpr field ctx_tmplt_fields[] = {
     CDB_ROW(ctx_tmplt_t, u_ctxt, ::cdb::field_kind::reference),
     CDB_FIELD(ctx_tmplt_t, ctxt_tbl_index, number),
@@ -377,7 +406,7 @@ inline constexpr field ctx_tmplt_fields[] = {
 };
 static_assert(tiles(ctx_tmplt_fields, sizeof(ctx_tmplt_t)));
 
-/* Out-of-line values. */
+/** The fields of vx_array_t. */
 inline constexpr field array_fields[] = {
     CDB_FIELD(vx_array_t, element_count, number),
     CDB_FIELD(vx_array_t, pad, reserved),
@@ -385,6 +414,7 @@ inline constexpr field array_fields[] = {
 };
 static_assert(tiles(array_fields, sizeof(vx_array_t)));
 
+/** The fields of vx_structured_data_t. */
 inline constexpr field structured_data_fields[] = {
     CDB_FIELD(vx_structured_data_t, element_count, number),
     CDB_FIELD(vx_structured_data_t, pad, reserved),
@@ -392,6 +422,7 @@ inline constexpr field structured_data_fields[] = {
 };
 static_assert(tiles(structured_data_fields, sizeof(vx_structured_data_t)));
 
+/** The fields of vx_structured_data_element_t. */
 inline constexpr field structured_data_element_fields[] = {
     CDB_FIELD(vx_structured_data_element_t, data_type, number),
     CDB_FIELD(vx_structured_data_element_t, pad, reserved),
@@ -399,8 +430,9 @@ inline constexpr field structured_data_element_fields[] = {
 };
 static_assert(tiles(structured_data_element_fields, sizeof(vx_structured_data_element_t)));
 
-/* The fields of a record, by its type; nothing for a type that is none. */
+/** The fields of a record of this type, in their order; empty for a type that is not a record. */
 template <class Record> inline constexpr std::span<const field> fields_of = {};
+/** @cond */
 template <> inline constexpr std::span<const field> fields_of<orb_cdb_header_t> = cdb_header_fields;
 template <> inline constexpr std::span<const field> fields_of<cdb_dsect_anchor_t> = cdb_dsect_anchor_fields;
 template <> inline constexpr std::span<const field> fields_of<rsrc_class_t> = class_fields;
@@ -424,6 +456,7 @@ template <> inline constexpr std::span<const field> fields_of<vx_array_t> = arra
 template <> inline constexpr std::span<const field> fields_of<vx_structured_data_t> = structured_data_fields;
 template <>
 inline constexpr std::span<const field> fields_of<vx_structured_data_element_t> = structured_data_element_fields;
+/** @endcond */
 
 } // namespace cdb
 

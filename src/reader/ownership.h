@@ -51,7 +51,6 @@ class ownership {
 public:
     /* findings: all that verify() finds in the database. */
     ownership(const database &db, std::span<const finding> findings);
-    explicit ownership(const database &db) : ownership(db, verify(db)) {}
 
     /* offset: of the reference or the cell, in the file. */
     bool is_own(std::size_t offset) const {

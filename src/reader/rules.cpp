@@ -1,6 +1,6 @@
 /* rules.cpp: what verification checks. */
 
-#include "reader/walk.h"
+#include "reader/rules.h"
 
 #include <iterator>
 

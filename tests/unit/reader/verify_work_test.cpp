@@ -2,7 +2,7 @@
  * at more than once would be reported more than once, so the findings are counted: each image has one thing that much
  * refers to, and something wrong with each of its parts. */
 
-#include "reader/walk.h"
+#include "reader/extent.h"
 
 #include "reader/image_files.h"
 

@@ -1,0 +1,208 @@
+/* references.cpp: the walk over whatever a class's records refer to. */
+
+#include "reader/references.h"
+
+#include <utility>
+
+namespace cdb {
+
+/* A kind of list. All three start with an identifier and a count. */
+struct list_format {
+    std::string_view record;
+    std::string_view id_field;
+    std::string_view count_field;
+    vx_uint32_t id;
+    std::size_t entry; /* bytes */
+    std::span<const field> fields;
+};
+
+namespace {
+
+constexpr std::size_t LIST_HEAD = 8; /* bytes */
+constexpr std::size_t LIST_COUNT = 4;
+static_assert(offsetof(variety_list_t, vl_values) == LIST_HEAD && offsetof(variety_list_t, vl_count) == LIST_COUNT);
+static_assert(offsetof(valid_values_t, vv_values) == LIST_HEAD && offsetof(valid_values_t, vv_count) == LIST_COUNT);
+static_assert(offsetof(sd_def_t, sd_fields) == LIST_HEAD && offsetof(sd_def_t, sd_count) == LIST_COUNT);
+
+constexpr list_format variety_format = {"variety_list_t",    "vl_cb_ID",         "vl_count",
+                                        CDB_ID_VARIETY_LIST, sizeof(vl_entry_t), variety_list_fields};
+constexpr list_format valid_values_format = {"valid_values_t",    "vv_cb_ID",         "vv_count",
+                                             CDB_ID_VALID_VALUES, sizeof(vv_entry_t), valid_values_fields};
+constexpr list_format sd_format = {"sd_def_t",    "sd_cb_ID",         "sd_count",
+                                   CDB_ID_SD_DEF, sizeof(sd_field_t), sd_def_fields};
+
+std::size_t in_file(const bytes &table, const bytes &section, const location &class_at) {
+    return class_at.offset +
+           (table.size() == 0 ? 0 : static_cast<std::size_t>(table.raw().data() - section.raw().data()));
+}
+
+} // namespace
+
+reference_walk::reference_walk(reporter &to, const location &class_at, const class_tables &of)
+    : tables(of), texts(to, class_at, of.strings, in_file(of.strings, of.section, class_at)),
+      values(to, texts, class_at), out(to), section(class_at.section),
+      valid_vals(of.valid_vals, in_file(of.valid_vals, of.section, class_at)),
+      variety_lists(of.variety_lists, in_file(of.variety_lists, of.section, class_at)),
+      sd_defs(of.sd_defs, in_file(of.sd_defs, of.section, class_at)) {}
+
+bool reference_walk::take_found_shared() {
+    bool shared_value = std::exchange(values.found_shared, false);
+    return std::exchange(found_shared_list, false) || shared_value;
+}
+
+/* ---- Fields ---------------------------------------------------------------------------------------------------- */
+
+/* A source can leave an element's type unknown, and a following class an attribute's. Structured byte strings are
+ * types, but have no values. */
+void reference_walk::expect_data_type(const location &place, std::string_view field, std::size_t offset,
+                                      vx_data_type_t type) {
+    if (!is_data_type(type))
+        out.report(check::DATA_TYPE, place, field, place.offset + offset, std::to_string(type), "0 to 22");
+    else if (type == VX_UNKNOWN || type == VX_SBS_PTR)
+        out.report(check::UNKNOWN_TYPE, place, field, place.offset + offset, std::string(name_of(type)),
+                   "a type with values");
+}
+
+void reference_walk::follow(const location &place, const bytes &area, std::size_t offset, std::span<const field> fields,
+                            vx_data_type_t owner_type) {
+    for (const field &f : fields) {
+        auto type = f.type_at == TYPE_OF_OWNER ? owner_type : area.number<vx_data_type_t>(offset + f.type_at);
+        follow_field(place, f, area.number<std::uint32_t>(offset + f.offset), type);
+    }
+}
+
+void reference_walk::follow_field(const location &place, const field &f, std::uint32_t word, vx_data_type_t type) {
+    if (f.kind == field_kind::reference)
+        follow_reference(place, f, word, type);
+    else if (is_out_of_line(type))
+        values.walk({place, f.name, place.offset + f.offset}, word, type);
+}
+
+void reference_walk::follow_reference(const location &place, const field &f, std::uint32_t word, vx_data_type_t type) {
+    switch (f.to) {
+    case target::strings:
+        return texts.visit(place, f, word, names_may_be_unset);
+    case target::variety_lists:
+        return walk_varieties(place, f, word);
+    case target::valid_vals:
+        evidence.has_owner = evidence.has_owner || word == 0;
+        return walk_valid_values(place, f, word, type);
+    case target::sd_defs:
+        return walk_sd_definition(place, f, word);
+    case target::section:
+    case target::none:
+        return;
+    }
+}
+
+/* ---- Lists ----------------------------------------------------------------------------------------------------- */
+
+/* Where the entries of a list start, if there is a list and it has no other owner. */
+std::optional<std::size_t> reference_walk::find_list(const location &place, const field &ref, std::uint32_t offset,
+                                                     extent &lists, const list_format &format) {
+    auto refuse = [&](check broken, std::string expected) {
+        out.report(broken, place, ref.name, place.offset + ref.offset,
+                   offset == CDB_NONE ? "none" : std::to_string(offset), std::move(expected));
+        return std::nullopt;
+    };
+    if (offset == CDB_NONE)
+        return ref.optional ? std::nullopt : refuse(check::REFERENCE_NONE, "a list");
+    if (!lists.area.holds(offset, LIST_HEAD))
+        return refuse(check::REFERENCE_OUTSIDE, "in " + std::to_string(lists.area.size()) + " bytes");
+    if (offset % extent::UNIT != 0)
+        return refuse(check::REFERENCE_UNALIGNED, "a multiple of 8");
+    location list_at = {section, format.record, offset, lists.offset + offset};
+    std::size_t count = lists.area.number<std::uint32_t>(offset + LIST_COUNT);
+    std::size_t room = (lists.area.size() - offset - LIST_HEAD) / format.entry;
+    out.expect_id(list_at, format.id_field, lists.area.number<vx_uint32_t>(offset), format.id);
+    if (count > room) {
+        out.report(check::LIST_OUTSIDE, list_at, format.count_field, list_at.offset + LIST_COUNT, std::to_string(count),
+                   "at most " + std::to_string(room));
+        return std::nullopt;
+    }
+    if (claim_list(list_at, count, lists, format))
+        return offset + LIST_HEAD;
+    found_shared_list = true;
+    return refuse(check::LIST_SHARED, "a list of its own");
+}
+
+/* Claims a list that lies inside its table; false if some of it has an owner. An empty list has room for one entry, if
+ * the table has. */
+bool reference_walk::claim_list(const location &list_at, std::size_t count, extent &lists, const list_format &format) {
+    std::size_t first = list_at.index + LIST_HEAD;
+    std::size_t held = count == 0 && lists.area.size() - first >= format.entry ? 1 : count;
+    if (lists.claim(list_at.index, LIST_HEAD + held * format.entry) != extent::claim_result::FIRST)
+        return false;
+    for (const field &f : format.fields.first(format.fields.size() - 1))
+        out.add_region(list_at, list_at.offset + f.offset, f.width, format.record, &f);
+    if (count < held) {
+        location room_at = {section, format.record, list_at.index, list_at.offset + LIST_HEAD};
+        out.expect_zero(room_at, "filling", lists.area, first, format.entry, room_at.offset);
+        out.add_region(room_at, room_at.offset, format.entry, "filling");
+    }
+    return true;
+}
+
+void reference_walk::walk_varieties(const location &place, const field &ref, std::uint32_t offset) {
+    std::optional<std::size_t> first = find_list(place, ref, offset, variety_lists, variety_format);
+    if (!first)
+        return;
+    auto count = variety_lists.area.number<std::uint32_t>(offset + LIST_COUNT);
+    location entry = {section, "vl_entry_t", 0, variety_lists.offset + *first};
+    for (; entry.index < count; ++entry.index, entry.offset += sizeof(vl_entry_t))
+        out.visit<vl_entry_t>(entry, variety_lists.area, entry.offset - variety_lists.offset);
+}
+
+void reference_walk::walk_valid_values(const location &place, const field &ref, std::uint32_t offset,
+                                       vx_data_type_t type) {
+    std::optional<std::size_t> first = find_list(place, ref, offset, valid_vals, valid_values_format);
+    if (!first)
+        return;
+    auto count = valid_vals.area.number<std::uint32_t>(offset + LIST_COUNT);
+    location entry = {section, "vv_entry_t", 0, valid_vals.offset + *first};
+    for (; entry.index < count; ++entry.index, entry.offset += sizeof(vv_entry_t)) {
+        std::size_t in_table = entry.offset - valid_vals.offset;
+        out.visit<vv_entry_t>(entry, valid_vals.area, in_table);
+        follow(entry, valid_vals.area, in_table, leading_fields_of<vv_entry_t>, element_type(type));
+    }
+}
+
+/* Every element has a name. */
+void reference_walk::walk_sd_definition(const location &place, const field &ref, std::uint32_t offset) {
+    std::optional<std::size_t> first = find_list(place, ref, offset, sd_defs, sd_format);
+    if (!first)
+        return;
+    bool owner_may_be_unset = std::exchange(names_may_be_unset, false);
+    auto count = sd_defs.area.number<std::uint32_t>(offset + LIST_COUNT);
+    location element = {section, "sd_field_t", 0, sd_defs.offset + *first};
+    for (; element.index < count; ++element.index, element.offset += sizeof(sd_field_t)) {
+        std::size_t in_table = element.offset - sd_defs.offset;
+        auto type = sd_defs.area.number<vx_data_type_t>(in_table + offsetof(sd_field_t, sd_field_type));
+        out.visit<sd_field_t>(element, sd_defs.area, in_table);
+        expect_data_type(element, "sd_field_type", offsetof(sd_field_t, sd_field_type), type);
+        follow(element, sd_defs.area, in_table, leading_fields_of<sd_field_t>, type);
+    }
+    names_may_be_unset = owner_may_be_unset;
+}
+
+void reference_walk::report_unreached(const extent &lists, std::string_view name) {
+    location place = {section, name, 0, lists.offset};
+    std::size_t size = lists.area.size();
+    for (std::size_t from = 0; from < size; from += extent::UNIT) {
+        std::size_t to = from;
+        while (to < size && !lists.is_taken(to))
+            to += extent::UNIT;
+        if (to > from)
+            out.report(check::LIST_UNREACHED, place, {}, lists.offset + from,
+                       std::to_string(std::min(to, size) - from) + " bytes", "an owner");
+        from = to;
+    }
+}
+
+void reference_walk::report_unreached() {
+    report_unreached(variety_lists, "variety_list_t");
+    report_unreached(sd_defs, "sd_def_t");
+    report_unreached(valid_vals, "valid_values_t");
+}
+
+} // namespace cdb

@@ -1,0 +1,183 @@
+/* verify.cpp: the one walk over a database that verification and the map of its regions share. It visits whatever the
+ * header leads to once. */
+
+#include "format/sections.h"
+#include "reader/class.h"
+#include "reader/header.h"
+#include "reader/sections.h"
+
+#include <utility>
+
+namespace cdb {
+
+namespace {
+
+class file_walk {
+public:
+    /* map: null if no regions are wanted. */
+    file_walk(const database &walked, std::vector<finding> &to, std::vector<region> *map)
+        : db(walked), out(to, map), last_class(find_last_class(walked)) {}
+
+    void run();
+
+private:
+    static std::size_t find_last_class(const database &db);
+    void walk_anchors();
+    void walk_anchor(std::size_t index);
+    bool place_section(const location &at, const cdb_dsect_anchor_t &anchor);
+    void walk_section(const location &anchor_at, const cdb_dsect_anchor_t &anchor, const section_kind &kind);
+    void walk_section_of(cdb_dsect_type_t type, const location &at, const bytes &section);
+    std::span<const var_id_t> sorted_ids();
+
+    const database &db;
+    reporter out;
+    std::size_t last_class;            /* position of the last class among the anchors */
+    std::size_t sections_end = 0;      /* where the sections walked so far end, in the file */
+    int section_rank = 0;              /* the highest so far, in the order of types */
+    std::vector<var_id_t> dynamic_ids; /* of the classes before the first variable class */
+    bool dynamic_ids_sorted = false;   /* a variable class was met */
+};
+
+std::size_t file_walk::find_last_class(const database &db) {
+    std::size_t last = 0;
+    for (std::size_t i = 0; i < db.section_count(); ++i)
+        if (db.anchor(i).cda_type == CDB_DSECT_CLASS)
+            last = i;
+    return last;
+}
+
+/* Sections follow each other without gaps. One that overlaps those before it is not walked: the work must not depend on
+ * how many anchors lead to the same bytes. */
+bool file_walk::place_section(const location &at, const cdb_dsect_anchor_t &anchor) {
+    std::size_t place = at.offset + offsetof(cdb_dsect_anchor_t, cda_offset);
+    if (!db.file().holds(anchor.cda_offset, anchor.cda_length)) {
+        out.report(check::SECTION_OUTSIDE, at, "cda_offset", place,
+                   std::to_string(anchor.cda_offset) + " + " + std::to_string(anchor.cda_length),
+                   "at most " + std::to_string(db.file().size()));
+        return false;
+    }
+    if (anchor.cda_offset != sections_end)
+        out.report(check::SECTION_PLACE, at, "cda_offset", place, anchor.cda_offset, sections_end);
+    if (anchor.cda_offset < sections_end)
+        return false;
+    sections_end = std::size_t{anchor.cda_offset} + anchor.cda_length;
+    return true;
+}
+
+void file_walk::walk_anchor(std::size_t index) {
+    location at = {.section = index,
+                   .record = "cdb_dsect_anchor_t",
+                   .index = index,
+                   .offset = sizeof(orb_cdb_header_t) + index * sizeof(cdb_dsect_anchor_t)};
+    out.visit<cdb_dsect_anchor_t>(at, db.file(), at.offset);
+    cdb_dsect_anchor_t anchor = db.anchor(index);
+    if (!place_section(at, anchor))
+        return;
+    if (const section_kind *kind = kind_of(anchor.cda_type))
+        return walk_section(at, anchor, *kind);
+    bool unused = anchor.cda_type < std::size(section_kinds);
+    out.report(unused ? check::SECTION_UNUSED : check::SECTION_TYPE, at, "cda_type", at.offset,
+               std::to_string(anchor.cda_type), "3 to 7");
+}
+
+void file_walk::walk_anchors() {
+    std::size_t count = db.section_count();
+    if (count < db.header().cdb_hdr_dsect_count)
+        out.report(check::ANCHORS_OUTSIDE, whole_file, "cdb_hdr_dsect_count",
+                   offsetof(orb_cdb_header_t, cdb_hdr_dsect_count), db.header().cdb_hdr_dsect_count, count);
+    sections_end = sizeof(orb_cdb_header_t) + count * sizeof(cdb_dsect_anchor_t);
+    for (std::size_t i = 0; i < count; ++i)
+        walk_anchor(i);
+    if (sections_end != db.file().size())
+        out.report(check::SECTION_PLACE, whole_file, {}, sections_end,
+                   "end of the last section at " + std::to_string(sections_end),
+                   "end of the file at " + std::to_string(db.file().size()));
+}
+
+void file_walk::walk_section(const location &anchor_at, const cdb_dsect_anchor_t &anchor, const section_kind &kind) {
+    if (kind.rank < section_rank)
+        out.report(check::SECTION_ORDER, anchor_at, "cda_type", anchor_at.offset, anchor.cda_type,
+                   type_of_rank(section_rank));
+    section_rank = std::max(section_rank, kind.rank);
+    if (anchor.cda_length < kind.root->size)
+        out.report(check::SECTION_LENGTH, anchor_at, "cda_length",
+                   anchor_at.offset + offsetof(cdb_dsect_anchor_t, cda_length), std::to_string(anchor.cda_length),
+                   "at least " + std::to_string(kind.root->size));
+    else
+        walk_section_of(kind.type, {anchor_at.section, kind.root->record, 0, anchor.cda_offset},
+                        db.file().part(anchor.cda_offset, anchor.cda_length));
+}
+
+/* A variable class may refer to the attributes of classes before the first variable class only. */
+void file_walk::walk_section_of(cdb_dsect_type_t type, const location &at, const bytes &section) {
+    std::vector<var_id_t> too_late;
+    switch (type) {
+    case CDB_DSECT_CLASS:
+        return walk_class(out, at, section, at.section == last_class, dynamic_ids_sorted ? too_late : dynamic_ids);
+    case CDB_DSECT_RSRC_MGR:
+        return walk_manager(out, at, section);
+    case CDB_DSECT_CMMAP:
+        return walk_map(out, at, section);
+    case CDB_DSECT_VAR_CLASS:
+        return walk_variable_class(out, at, section, sorted_ids());
+    case CDB_DSECT_CLASS_HASH:
+        return walk_class_hash(out, at, section);
+    case CDB_DSECT_UNUSED:
+    case CDB_DSECT_EMPTY:
+    case CDB_DSECT_TBL_CNTRS:
+        return;
+    }
+}
+
+std::span<const var_id_t> file_walk::sorted_ids() {
+    if (!std::exchange(dynamic_ids_sorted, true))
+        std::sort(dynamic_ids.begin(), dynamic_ids.end());
+    return dynamic_ids;
+}
+
+void file_walk::run() {
+    if (!check_header(out, db))
+        return;
+    walk_anchors();
+    check_largest_ids(out, db);
+}
+
+} // namespace
+
+std::vector<finding> verify(const database &db) {
+    std::vector<finding> findings;
+    file_walk(db, findings, nullptr).run();
+    return findings;
+}
+
+bool is_sound(std::span<const finding> findings) {
+    return std::none_of(findings.begin(), findings.end(),
+                        [](const finding &f) { return f.broken->level == severity::error; });
+}
+
+/* In a damaged file two regions may overlap: the one that starts first counts, and of two that start together the
+ * longer one. */
+std::vector<region> regions(const database &db) {
+    std::vector<finding> findings;
+    std::vector<region> seen, all;
+    file_walk(db, findings, &seen).run();
+    std::stable_sort(seen.begin(), seen.end(), [](const region &a, const region &b) {
+        return a.offset != b.offset ? a.offset < b.offset : a.size > b.size;
+    });
+    std::size_t end = 0;
+    auto fill = [&](std::size_t to) {
+        if (to > end)
+            all.push_back({end, to - end, std::nullopt, "unreached", 0, nullptr});
+    };
+    for (const region &r : seen) {
+        if (r.offset < end)
+            continue;
+        fill(r.offset);
+        all.push_back(r);
+        end = r.offset + r.size;
+    }
+    fill(db.file().size());
+    return all;
+}
+
+} // namespace cdb

@@ -2,6 +2,7 @@
  * forward. Records go in and out of it by copying, since sections are not aligned. */
 
 #include "compiler/cdgen.h"
+#include "format/sections.h"
 
 #include <algorithm>
 #include <array>
@@ -229,28 +230,6 @@ private:
     cdb_dsect_anchor_t anchor;
 };
 
-/* How a class's side table goes into the file, in this order. */
-struct class_side_table {
-    cdb_ref_t rsrc_class_t::*field;
-    enum { LOCATED, UNLOCATED, ROUNDED } form; /* with its offset; deliberately without; with, rounded up to 8 */
-};
-
-constexpr class_side_table class_side_tables[] = {
-    {&rsrc_class_t::u_rc_pattrsC, class_side_table::LOCATED},
-    {&rsrc_class_t::u_rc_dattrsC, class_side_table::LOCATED},
-    {&rsrc_class_t::u_rc_pattrs, class_side_table::LOCATED},
-    {&rsrc_class_t::u_rc_dattrs, class_side_table::LOCATED},
-    {&rsrc_class_t::u_rc_actionsC, class_side_table::LOCATED},
-    {&rsrc_class_t::u_rc_actions, class_side_table::LOCATED},
-    {&rsrc_class_t::u_rc_errors, class_side_table::UNLOCATED},
-    {&rsrc_class_t::u_rc_depends, class_side_table::UNLOCATED},
-    {&rsrc_class_t::u_rc_variety_lists, class_side_table::LOCATED},
-    {&rsrc_class_t::u_rc_sbs_defs, class_side_table::UNLOCATED},
-    {&rsrc_class_t::u_rc_sd_defs, class_side_table::LOCATED},
-    {&rsrc_class_t::u_rc_valid_vals, class_side_table::LOCATED},
-    {&rsrc_class_t::u_rc_strings, class_side_table::ROUNDED},
-};
-
 /* The places of references that are none, once the class's tables have theirs. Classes are the first sections. */
 void note_nowhere(cdgen &cx, const rsrc_class_t &record, const char *at) {
     for (; cx.strays_done < cx.strays.size(); ++cx.strays_done) {
@@ -265,13 +244,13 @@ void add_class(cdgen &cx, const rsrc_class_t &staged) {
     section out(cx, CDB_DSECT_CLASS);
     char *at = out.write(&staged, sizeof staged);
     rsrc_class_t record = staged;
-    for (auto [field, form] : class_side_tables) {
+    for (const cdb::side_table &table : cdb::side_tables) {
         auto offset = static_cast<vx_uint32_t>(cx.dsp - at);
-        record.*field = {{form == class_side_table::UNLOCATED ? 0 : offset, 0}};
-        if (form == class_side_table::ROUNDED)
-            out.write_rounded(staged_content(staged.*field));
+        record.*table.ref = {{table.form == cdb::table_form::UNLOCATED ? 0 : offset, 0}};
+        if (table.form == cdb::table_form::ROUNDED)
+            out.write_rounded(staged_content(staged.*table.ref));
         else
-            out.write_table(staged.*field);
+            out.write_table(staged.*table.ref);
     }
     store(at, record);
     note_nowhere(cx, record, at);
@@ -342,15 +321,8 @@ void write_header(cdgen &cx) {
     header.cdb_hdr_seqno = 0;
     header.cdb_hdr_timestamp = timestamp();
     header.cdb_hdr_dsect_count = static_cast<vx_uint32_t>(cx.dsect_count);
-    header.cdb_hdr_rsrc_class_size = sizeof(rsrc_class_t);
-    header.cdb_hdr_rsrc_cmmap_size = sizeof(rsrc_cmmap_t);
-    header.cdb_hdr_rsrc_mgr_size = sizeof(rsrc_mgr_t);
-    header.cdb_hdr_rsrc_variable_class_size = sizeof(rsrc_variable_class_t);
-    header.cdb_hdr_rsrc_pattr_size = sizeof(rsrc_pattr_t);
-    header.cdb_hdr_rsrc_dattr_size = sizeof(rsrc_dattr_t);
-    header.cdb_hdr_rsrc_action_size = sizeof(rsrc_action_t);
-    header.cdb_hdr_rsrc_error_size = sizeof(rsrc_error_t);
-    header.cdb_hdr_rsrc_depend_size = sizeof(rsrc_depend_t);
+    for (const cdb::recorded_size &recorded : cdb::recorded_sizes)
+        store(reinterpret_cast<char *>(&header) + recorded.at, static_cast<vx_uint16_t>(recorded.size));
     store(cx.chp, header);
     header.cdb_hdr_checksum = cdb_checksum(cx.chp, header.cdb_hdr_length, header.cdb_hdr_length);
     store(cx.chp, header);

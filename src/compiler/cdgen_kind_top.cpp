@@ -1,6 +1,7 @@
 /* cdgen_kind_top.cpp: class-to-manager maps, managers, variable classes and resource classes. */
 
 #include "compiler/cdgen_kind.h"
+#include "format/sections.h"
 
 #include <cstdlib>
 #include <type_traits>
@@ -8,30 +9,6 @@
 namespace {
 
 constexpr size_t STRINGS_AU = 8192;
-
-/* A side table of the class: the field that refers to it, and how it grows. */
-struct class_table {
-    cdb_ref_t rsrc_class_t::*field;
-    const char *name;
-    size_t au;
-};
-
-/* In the order in which they are made. */
-constexpr class_table class_tables[] = {
-    {&rsrc_class_t::u_rc_pattrsC, "ClassPattrsC", 16 * sizeof(rsrc_pattr_t)},
-    {&rsrc_class_t::u_rc_dattrsC, "ClassDattrsC", 16 * sizeof(rsrc_dattr_t)},
-    {&rsrc_class_t::u_rc_pattrs, "ClassPattrs", 16 * sizeof(rsrc_pattr_t)},
-    {&rsrc_class_t::u_rc_dattrs, "ClassDattrs", 16 * sizeof(rsrc_dattr_t)},
-    {&rsrc_class_t::u_rc_actionsC, "ClassActionsC", 4 * sizeof(rsrc_action_t)},
-    {&rsrc_class_t::u_rc_actions, "ClassActions", 4 * sizeof(rsrc_action_t)},
-    {&rsrc_class_t::u_rc_errors, "ClassErrors", 4 * sizeof(rsrc_error_t)},
-    {&rsrc_class_t::u_rc_depends, "ClassDepends", 4 * sizeof(rsrc_depend_t)},
-    {&rsrc_class_t::u_rc_sbs_defs, "ClassSBSDefs", 8 * sizeof(sbs_def_t)},
-    {&rsrc_class_t::u_rc_valid_vals, "ClassValidVals", 8 * sizeof(valid_values_t)},
-    {&rsrc_class_t::u_rc_variety_lists, "ClassVarietyList", 4 * sizeof(variety_list_t)},
-    {&rsrc_class_t::u_rc_strings, "ClassStrings", STRINGS_AU},
-    {&rsrc_class_t::u_rc_sd_defs, "ClassSDDefs", 4 * sizeof(sd_def_t)},
-};
 
 /* Absent until a stanza says otherwise. (Those of side tables are taken by their tables at once.) */
 constexpr cdb_ref_t rsrc_class_t::*absent_at_open[] = {
@@ -131,8 +108,8 @@ void init_class_tbl(cdgen &cx) {
     rsrc_class.rc_cb_ID = CDB_ID_CLASS;
     for (auto field : absent_at_open)
         mark_absent(rsrc_class.*field);
-    for (const class_table &table : class_tables)
-        stage_tbl(rsrc_class.*table.field, make_tbl(cx, table.au, table.name));
+    for (const cdb::side_table &table : cdb::side_tables_as_made)
+        stage_tbl(rsrc_class.*table.ref, make_tbl(cx, table.growth, table.trace_name));
 }
 
 /* ResourceClass goes on with the record that ControlDefinition opened. */
@@ -146,8 +123,8 @@ void cmplt_class_tbl(cdgen &cx) {
     flush_raw(cx, cx.cb_rsrc_dattrC, &rsrc_class_t::u_rc_dattrsC, cx.dattrC_vv_found);
     flush_raw(cx, cx.cb_rsrc_pattr, &rsrc_class_t::u_rc_pattrs, cx.pattr_vv_found);
     flush_raw(cx, cx.cb_rsrc_dattr, &rsrc_class_t::u_rc_dattrs, cx.dattr_vv_found);
-    for (const class_table &table : class_tables)
-        file_tbl(cx, rsrc_class.*table.field);
+    for (const cdb::side_table &table : cdb::side_tables_as_made)
+        file_tbl(cx, rsrc_class.*table.ref);
     append_record(cx, &cx.rsrc_class_tbl, rsrc_class);
     ++cx.rsrc_class_count;
     rsrc_class.rc_cb_ID = 0;

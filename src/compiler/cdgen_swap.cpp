@@ -4,6 +4,7 @@
 
 #include "cdb_fields.h"
 #include "compiler/cdgen.h"
+#include "format/sections.h"
 
 #include <algorithm>
 #include <span>
@@ -221,37 +222,22 @@ struct swap_section {
     }
 };
 
-/* A table of a class's records. */
-struct class_table {
-    cdb_ref_t rsrc_class_t::*records;
-    vx_uint16_t rsrc_class_t::*count;
-    size_t size;
-    decltype(&swap_pattr) swap;
-};
+/* What reverses the records of a class's tables, in the order of the file. */
+constexpr decltype(&swap_pattr) record_swaps[] = {swap_pattr,  swap_dattr,  swap_pattr,  swap_dattr,
+                                                  swap_action, swap_action, swap_errors, swap_depends};
+static_assert(std::size(record_swaps) == cdb::TABLES_OF_RECORDS);
 
-constexpr class_table attribute_tables[] = {
-    {&rsrc_class_t::u_rc_pattrsC, &rsrc_class_t::rc_num_pattrsC, sizeof(rsrc_pattr_t), swap_pattr},
-    {&rsrc_class_t::u_rc_dattrsC, &rsrc_class_t::rc_num_dattrsC, sizeof(rsrc_dattr_t), swap_dattr},
-    {&rsrc_class_t::u_rc_pattrs, &rsrc_class_t::rc_num_pattrs, sizeof(rsrc_pattr_t), swap_pattr},
-    {&rsrc_class_t::u_rc_dattrs, &rsrc_class_t::rc_num_dattrs, sizeof(rsrc_dattr_t), swap_dattr},
-};
-
-constexpr class_table other_tables[] = {
-    {&rsrc_class_t::u_rc_actionsC, &rsrc_class_t::rc_num_actionsC, sizeof(rsrc_action_t), swap_action},
-    {&rsrc_class_t::u_rc_actions, &rsrc_class_t::rc_num_actions, sizeof(rsrc_action_t), swap_action},
-    {&rsrc_class_t::u_rc_errors, &rsrc_class_t::rc_num_errors, sizeof(rsrc_error_t), swap_errors},
-    {&rsrc_class_t::u_rc_depends, &rsrc_class_t::rc_num_depends, sizeof(rsrc_depend_t), swap_depends},
-};
-
-void swap_class_tables(const swap_section &section, const rsrc_class_t &rc, std::span<const class_table> tables,
-                       const swap_areas &areas) {
-    for (const class_table &table : tables) {
-        vx_uint32_t offset = (rc.*table.records).offset[0];
+void swap_tables(const swap_section &section, const rsrc_class_t &rc, size_t first, size_t last,
+                 const swap_areas &areas) {
+    for (size_t i = first; i < last; ++i) {
+        const cdb::side_table &table = cdb::side_tables[i];
+        vx_uint32_t offset = (rc.*table.ref).offset[0];
         if (offset == CDB_NONE)
             continue;
-        vx_uint32_t count = section.records_inside(offset, rc.*table.count, table.size);
+        vx_uint32_t count = section.records_inside(offset, rc.*table.count, table.record->size);
         if (count > 0)
-            table.swap(section.start + offset, count, areas.sbase_p, areas.vvbase_p, areas.vlbase_p, areas.sdbase_p);
+            record_swaps[i](section.start + offset, count, areas.sbase_p, areas.vvbase_p, areas.vlbase_p,
+                            areas.sdbase_p);
     }
 }
 
@@ -265,9 +251,9 @@ void swap_class(const swap_section &section) {
     swap_area variety_lists = section.area(rc.u_rc_variety_lists, rc.rc_varlist_size);
     swap_area sd_defs = section.area(rc.u_rc_sd_defs, rc.rc_sd_size);
     swap_areas areas = {strings, valid_vals, variety_lists, sd_defs};
-    swap_class_tables(section, rc, attribute_tables, areas);
+    swap_tables(section, rc, 0, cdb::TABLES_OF_ATTRIBUTES, areas);
     follow_references<cdb::class_fields>(section.start, VX_UNKNOWN, areas); /* the five SD inputs */
-    swap_class_tables(section, rc, other_tables, areas);
+    swap_tables(section, rc, cdb::TABLES_OF_ATTRIBUTES, cdb::TABLES_OF_RECORDS, areas);
     swap_fields<cdb::class_fields>(section.start);
 }
 

@@ -113,6 +113,11 @@ inline constexpr side_table side_tables[] = {
     {&rsrc_class_t::u_rc_strings, nullptr, nullptr, nullptr, "ClassStrings", 8192, 11, table_form::ROUNDED},
 };
 
+/* The first so many of them are tables of records; the first four, of attributes. */
+inline constexpr std::size_t TABLES_OF_RECORDS = static_cast<std::size_t>(std::count_if(
+    std::begin(side_tables), std::end(side_tables), [](const side_table &t) { return t.record != nullptr; }));
+inline constexpr std::size_t TABLES_OF_ATTRIBUTES = 4;
+
 /* In the order in which the compiler makes them. */
 inline constexpr std::array side_tables_as_made = [] {
     std::array<side_table, std::size(side_tables)> sorted = {};

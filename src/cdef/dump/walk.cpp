@@ -259,9 +259,7 @@ void walker::show_list(const record_at &r, const cdb::field &f) {
 void walker::show_class_tables(const cdb::resource_class &rc) {
     const rsrc_class_t &record = rc.record();
     const cdb::bytes &section = rc.side_tables().section;
-    for (const cdb::side_table &table : cdb::side_tables) {
-        if (table.record == nullptr)
-            continue;
+    for (const cdb::side_table &table : std::span(cdb::side_tables).first(cdb::TABLES_OF_RECORDS)) {
         std::size_t at = (record.*table.ref).offset[0];
         record_at entry = {*table.record, section, at, rc.side_tables()};
         /* At 0 stands the class: it is how a table says that it has no place. */

@@ -1,11 +1,14 @@
-/* check.cpp: what no source can say: fields that no line sets, sections that are not made. */
+/* check.cpp: what no source can say: fields that no line sets, and sections that the compiler does not make. */
 
-#include "cdef/source/source.h"
-#include "cdef/support/trouble.h"
-#include "format/records.h"
+#include "cdef/source/check.h"
+
+#include "cdef/source/error.h"
+#include "cdef/source/steps.h"
 #include "text/shown.h"
 
-namespace cdef {
+#include <optional>
+
+namespace cdef::source {
 
 namespace {
 
@@ -18,22 +21,22 @@ std::uint32_t number_at(const std::byte *from, std::size_t width) {
     return width == sizeof half ? half : whole;
 }
 
-/* True if the field holds whatever the source's lines, or their number and order, lead to. */
-bool depends_on_source(const cdb::field_fact &what) {
-    return what.is == cdb::role::LAYOUT || (!what.lines.empty() && !what.always);
+/* The value that the compiler gives a field in every file; nothing if lines fill it, or if it is layout. */
+std::optional<std::uint32_t> constant_in(const cdb::field_fact &fact) {
+    if (fact.is == cdb::role::LAYOUT || (!fact.always && !fact.lines.empty()))
+        return std::nullopt;
+    return fact.always.value_or(0);
 }
 
-/* Every other field has the one value that the compiler gives it. */
+/* Every field that no line fills has the value that the compiler gives it. */
 template <class Record> void require_plain(const Record &record, const std::string &place) {
     const auto *bytes = reinterpret_cast<const std::byte *>(&record);
-    const cdb::record_format &format = cdb::format_for<Record>;
-    for (std::size_t i = 0; i < format.fields.size(); ++i) {
-        const cdb::field &f = format.fields[i];
-        bool is_number = f.kind == cdb::field_kind::number || f.kind == cdb::field_kind::reference;
-        if (!is_number || depends_on_source(format.facts[i]))
+    for (const cdb::field &f : cdb::fields_of<Record>) {
+        if (f.kind != cdb::field_kind::number && f.kind != cdb::field_kind::reference)
             continue;
+        std::optional<std::uint32_t> expected = constant_in(cdb::format_for<Record>.fact_of(f));
         std::uint32_t found = number_at(bytes + f.offset, f.width);
-        if (found != format.facts[i].always.value_or(0))
+        if (expected && found != *expected)
             no_source(place, "no line sets " + std::string(f.name) + " to " + std::to_string(found));
     }
 }
@@ -43,17 +46,17 @@ void require_plain_definition(const cdb::sd_definition &definition, const std::s
         require_plain(e.record(), place + ", element " + text::quoted_ascii(e.name()));
 }
 
-template <class List> void require_plain_attributes(const List &list, std::string_view kind) {
+template <class List> void require_plain_attributes(const List &list, table from) {
     for (const auto &attr : list) {
-        std::string place = place_of(kind, attr.name());
+        std::string place = place_of(side_table_of(from).stanza, attr.name());
         require_plain(attr.record(), place);
         require_plain_definition(attr.structure(), place);
     }
 }
 
-void require_plain_actions(const cdb::resource_class &c, cdb::level level, std::string_view kind) {
-    for (const cdb::action &action : c.actions(level)) {
-        std::string place = place_of(kind, action.name());
+void require_plain_actions(const cdb::resource_class &c, table from) {
+    for (const cdb::action &action : c.actions(level_of(from))) {
+        std::string place = place_of(side_table_of(from).stanza, action.name());
         require_plain(action.record(), place);
         require_plain_definition(action.input(), place);
         require_plain_definition(action.response(), place);
@@ -66,12 +69,12 @@ void require_plain_class(const cdb::resource_class &c) {
     require_plain(c.record(), place);
     for (const class_input &input : class_inputs)
         require_plain_definition(c.sd_input(input.reference), place);
-    require_plain_attributes(c.persistent_attributes(of_resource), "PersistentResourceAttribute");
-    require_plain_attributes(c.persistent_attributes(of_class), "PersistentClassAttribute");
-    require_plain_attributes(c.dynamic_attributes(of_resource), "DynamicResourceAttribute");
-    require_plain_attributes(c.dynamic_attributes(of_class), "DynamicClassAttribute");
-    require_plain_actions(c, of_resource, "ResourceAction");
-    require_plain_actions(c, of_class, "ClassAction");
+    require_plain_attributes(c.persistent_attributes(of_resource), table::persistent_attributes);
+    require_plain_attributes(c.persistent_attributes(of_class), table::persistent_class_attributes);
+    require_plain_attributes(c.dynamic_attributes(of_resource), table::dynamic_attributes);
+    require_plain_attributes(c.dynamic_attributes(of_class), table::dynamic_class_attributes);
+    require_plain_actions(c, table::actions);
+    require_plain_actions(c, table::class_actions);
 }
 
 bool is_made(cdb_dsect_type_t type) {
@@ -99,14 +102,6 @@ void require_sections(const cdb::database &db) {
 
 } // namespace
 
-void no_source(const std::string &what, const std::string &why) {
-    throw trouble("no source: " + what + ": " + why);
-}
-
-std::string place_of(std::string_view kind, std::string_view name) {
-    return std::string(kind) + " " + text::quoted_ascii(name.substr(0, 100));
-}
-
 void require_settable(const cdb::database &db) {
     require_plain(db.header(), "database");
     require_sections(db);
@@ -120,4 +115,4 @@ void require_settable(const cdb::database &db) {
         require_plain(v.record(), place_of("ResourceVariableClass", v.name()));
 }
 
-} // namespace cdef
+} // namespace cdef::source

@@ -1,18 +1,17 @@
-/* groups.cpp: which variable class each dynamic attribute names. A database has it the other way round:
- * variable classes list the IDs of their attributes, in the order of the attributes. As long as IDs are unique, each
- * list says which attributes it means. Where they are not, attributes are dealt out so that every list comes about. */
+/* groups.cpp: which variable class each dynamic attribute names. */
 
-#include "cdef/source/source.h"
-#include "compare/compare.h"
+#include "cdef/source/groups.h"
+
+#include "cdef/source/error.h"
 
 #include <unordered_map>
 #include <unordered_set>
 
-namespace cdef {
+namespace cdef::source {
 
 namespace {
 
-/* Attributes looked at, the same ones again after each wrong choice. Careless sources need few choices. */
+/* How many members are looked at, the same ones again after each wrong choice. Careless sources need few choices. */
 constexpr std::size_t LOOKS_MAX = 20'000'000;
 
 /* A dynamic attribute as the lists know it. */
@@ -23,15 +22,10 @@ struct member {
     std::size_t index;
 };
 
-/* A variable class's IDs, and how many of them have been dealt with. */
-struct id_list {
+/* A variable class that lists IDs. */
+struct group {
     std::string name;
     std::vector<var_id_t> ids;
-    std::size_t done = 0;
-
-    bool is_done() const {
-        return done == ids.size();
-    }
 };
 
 /* Only an attribute that has all its required lines can name a variable class. */
@@ -56,28 +50,31 @@ std::vector<member> members_of(const std::vector<class_plan> &classes) {
 }
 
 /* Of variable classes with one name the first gets all IDs. */
-std::vector<id_list> lists_of(const cdb::database &db) {
-    std::vector<id_list> lists;
+std::vector<group> groups_of(const cdb::database &db) {
+    std::vector<group> groups;
     std::unordered_set<std::string> names;
     for (const cdb::variable_class &v : db.variable_classes()) {
         bool first = names.emplace(v.name()).second;
-        id_list list = {std::string(v.name()), {}, 0};
+        group list = {std::string(v.name()), {}};
         for (const cdb::variable_id &id : v.variable_ids())
             list.ids.push_back(id.number);
         if (!list.ids.empty() && (!first || list.name.empty()))
             no_source(place_of("ResourceVariableClass", v.name()), "no attribute can name it, but it lists some");
         if (!list.ids.empty())
-            lists.push_back(std::move(list));
+            groups.push_back(std::move(list));
     }
-    return lists;
+    return groups;
 }
 
 /* Deals members out to lists. A member goes to the one list that waits for its ID; only where several do is there a
  * choice, which may turn out wrong later. */
 class dealer {
 public:
-    dealer(const std::vector<member> &to_deal, std::vector<id_list> &to) : members(to_deal), lists(to) {
-        owners.resize(members.size(), NOBODY);
+    /* No list is empty. */
+    dealer(const std::vector<var_id_t> &to_deal, const std::vector<std::vector<var_id_t>> &to) : members(to_deal) {
+        owners.resize(members.size());
+        for (const std::vector<var_id_t> &ids : to)
+            lists.push_back({ids});
         for (std::size_t i = 0; i < lists.size(); ++i)
             waiting[lists[i].ids[0]].push_back(i);
     }
@@ -94,13 +91,21 @@ public:
         return false;
     }
 
-    /* The list of a member, or null. */
-    const id_list *owner(std::size_t member_index) const {
-        return owners[member_index] == NOBODY ? nullptr : &lists[owners[member_index]];
+    /* The list of each member. */
+    const std::vector<std::optional<std::size_t>> &result() const {
+        return owners;
     }
 
 private:
-    static constexpr std::size_t NOBODY = SIZE_MAX;
+    /* A list, and how many of its IDs have been dealt out. */
+    struct id_list {
+        const std::vector<var_id_t> &ids;
+        std::size_t done = 0;
+
+        bool is_done() const {
+            return done == ids.size();
+        }
+    };
 
     struct choice {
         std::size_t member;
@@ -109,7 +114,7 @@ private:
 
     void deal_rest() {
         for (; next < members.size(); ++next, ++looks) {
-            const std::vector<std::size_t> &candidates = waiting[members[next].id];
+            const std::vector<std::size_t> &candidates = waiting[members[next]];
             if (candidates.empty())
                 continue;
             if (candidates.size() > 1)
@@ -142,12 +147,13 @@ private:
     }
 
     void take_back(std::size_t m) {
-        if (owners[m] == NOBODY)
+        if (!owners[m])
             return;
-        stop_waiting(owners[m]);
-        --lists[owners[m]].done;
-        wait(owners[m]);
-        owners[m] = NOBODY;
+        std::size_t list = *owners[m];
+        stop_waiting(list);
+        --lists[list].done;
+        wait(list);
+        owners[m].reset();
     }
 
     void wait(std::size_t list) {
@@ -160,9 +166,9 @@ private:
             std::erase(waiting[lists[list].ids[lists[list].done]], list);
     }
 
-    const std::vector<member> &members;
-    std::vector<id_list> &lists;
-    std::vector<std::size_t> owners;                                /* by member */
+    const std::vector<var_id_t> &members;
+    std::vector<id_list> lists;
+    std::vector<std::optional<std::size_t>> owners;                 /* lists by member */
     std::unordered_map<var_id_t, std::vector<std::size_t>> waiting; /* lists by the ID that they wait for */
     std::vector<choice> choices;
     std::size_t looks = 0;
@@ -171,15 +177,27 @@ private:
 
 } // namespace
 
-void plan_variable_classes(std::vector<class_plan> &classes, const cdb::database &db) {
-    std::vector<member> members = members_of(classes);
-    std::vector<id_list> lists = lists_of(db);
+std::optional<std::vector<std::optional<std::size_t>>> deal_out(const std::vector<var_id_t> &members,
+                                                                const std::vector<std::vector<var_id_t>> &lists) {
     dealer dealing(members, lists);
-    if (!dealing.deal())
-        no_source("variable classes", "their lists of IDs do not follow from the dynamic attributes");
-    for (std::size_t i = 0; i < members.size(); ++i)
-        if (const id_list *list = dealing.owner(i))
-            classes[members[i].of_class].of(members[i].level)[members[i].index].variable_class = list->name;
+    return dealing.deal() ? std::optional(dealing.result()) : std::nullopt;
 }
 
-} // namespace cdef
+void plan_variable_classes(std::vector<class_plan> &classes, const cdb::database &db) {
+    std::vector<member> members = members_of(classes);
+    std::vector<group> groups = groups_of(db);
+    std::vector<var_id_t> ids;
+    std::vector<std::vector<var_id_t>> lists;
+    for (const member &m : members)
+        ids.push_back(m.id);
+    for (const group &g : groups)
+        lists.push_back(g.ids);
+    auto dealt = deal_out(ids, lists);
+    if (!dealt)
+        no_source("variable classes", "their lists of IDs do not follow from the dynamic attributes");
+    for (std::size_t i = 0; i < members.size(); ++i)
+        if (std::optional<std::size_t> list = (*dealt)[i])
+            classes[members[i].of_class].of(members[i].level)[members[i].index].variable_class = groups[*list].name;
+}
+
+} // namespace cdef::source

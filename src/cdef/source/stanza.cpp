@@ -1,10 +1,15 @@
 /* stanza.cpp: the stanzas of attributes, actions and inputs of a class. */
 
-#include "cdef/source/source.h"
-#include "compare/compare.h"
+#include "cdef/source/stanza.h"
+
+#include "cdef/source/error.h"
+#include "cdef/source/lists.h"
+#include "cdef/source/runs.h"
+#include "cdef/source/structure.h"
+#include "cdef/source/text.h"
 #include "format/names.h"
 
-namespace cdef {
+namespace cdef::source {
 
 namespace {
 
@@ -15,21 +20,18 @@ constexpr std::int64_t NO_GROUP = 255;
 constexpr std::uint32_t DEFAULT_PERMISSION = 0x40;
 constexpr std::string_view NO_PERMISSION = "-"; /* no permission letter */
 
-struct kind_names {
-    std::string_view stanza;
-    std::string_view run;       /* of SD stanzas; an action's input */
-    std::string_view other_run; /* that can come before it; an action's response */
+/* The runs of SD stanzas that belong to a record. */
+struct run_names {
+    std::string_view run;       /* an attribute's structure; an action's input */
+    std::string_view other_run; /* may come before it: one that it replaces; an action's response */
 };
 
-/* By table. */
-constexpr kind_names kinds[RECORD_TABLES] = {
-    {"PersistentClassAttribute", "PAttrSDDefinition", "DAttrSDDefinition"},
-    {"DynamicClassAttribute", "DAttrSDDefinition", "PAttrSDDefinition"},
-    {"PersistentResourceAttribute", "PAttrSDDefinition", "DAttrSDDefinition"},
-    {"DynamicResourceAttribute", "DAttrSDDefinition", "PAttrSDDefinition"},
-    {"ClassAction", "ActionInSDDefinition", "ActionOutSDDefinition"},
-    {"ResourceAction", "ActionInSDDefinition", "ActionOutSDDefinition"},
-};
+constexpr run_names runs_of(table t) {
+    if (t == table::class_actions || t == table::actions)
+        return {"ActionInSDDefinition", "ActionOutSDDefinition"};
+    return is_dynamic(t) ? run_names{"DAttrSDDefinition", "PAttrSDDefinition"}
+                         : run_names{"PAttrSDDefinition", "DAttrSDDefinition"};
+}
 
 void write_properties(source_writer &out, std::uint32_t bits, std::span<const props_t> known,
                       const std::string &place) {
@@ -55,21 +57,16 @@ std::uint32_t given_properties(std::uint32_t bits, bool cut_short, const std::st
     return bits & ~INVAL_FOR_DEFINE;
 }
 
-void write_varieties(source_writer &out, const cdb::variety_list &varieties) {
-    for (const cdb::variety &v : varieties)
-        out.line("VarietyRange", std::to_string(v.low) + "," + std::to_string(v.high));
-}
-
 /* One attribute's stanza. */
 template <class Record> class attribute_writer {
 public:
     attribute_writer(source_writer &to, const class_plan &of, const step &s, const cdb::attribute<Record> &attribute)
-        : out(to), plan(of), at(s), names(kinds[static_cast<std::size_t>(s.from)]), attr(attribute),
-          cut_short(of.is_cut_short(s)), place(place_of(names.stanza, attribute.name())) {}
+        : out(to), plan(of), at(s), stanza(side_table_of(s.from).stanza), attr(attribute),
+          cut_short(of.is_cut_short(s)), place(place_of(stanza, attribute.name())) {}
 
     void write() {
         out.blank_line();
-        out.stanza(names.stanza, place);
+        out.stanza(stanza, place);
         write_required();
         if (is_complete(attr))
             write_optional();
@@ -142,7 +139,7 @@ private:
         return plan.of(level_of(at.from))[at.index];
     }
 
-    /* Of an attribute cut short none is kept; nor of a persistent class attribute. */
+    /* Values given to an attribute cut short, or to a persistent class attribute, are not kept. */
     void write_value() {
         cdb::value value = own_value();
         if (cdb::element_type(attr.type()) == VX_SD_PTR)
@@ -166,7 +163,7 @@ private:
             out.line_of_any(name, texts_of(element, false));
     }
 
-    /* What only optional lines give; they cannot follow. */
+    /* Refuses what only optional lines give: they cannot follow. */
     void require_nothing_more() {
         const Record &r = attr.record();
         bool more = r.ra_props != 0 || r.ra_group_id != 0 || r.ra_group_msgid != 0 || !own_valid_values().empty();
@@ -179,6 +176,7 @@ private:
     }
 
     void write_runs() {
+        run_names names = runs_of(at.from);
         attribute_structure s = {.stanza = names.run,
                                  .other_stanza = names.other_run,
                                  .definition = attr.structure(),
@@ -187,7 +185,7 @@ private:
                                  .ends_file = plan.ends_in_run && is_last_step()};
         if (cdb::element_type(attr.type()) == VX_SD_PTR)
             write_structure(out, s, place);
-        else if (!s.definition.empty() || s.highest_index != 0xFFFF)
+        else if (!s.definition.empty() || s.highest_index != NO_INDEX)
             no_source(place, "a structure, but it is of another type");
     }
 
@@ -198,19 +196,11 @@ private:
     source_writer &out;
     const class_plan &plan;
     step at;
-    const kind_names &names;
+    std::string_view stanza;
     const cdb::attribute<Record> &attr;
     bool cut_short;
     std::string place;
 };
-
-bool is_same(const cdb::value &a, const cdb::value &b) {
-    if (a.type() == VX_CHAR_PTR)
-        return a.text() == b.text();
-    if (a.type() == VX_BINARY_PTR)
-        return std::equal(a.binary().begin(), a.binary().end(), b.binary().begin(), b.binary().end());
-    return texts_of(a, true) == texts_of(b, true);
-}
 
 void write_permission(source_writer &out, std::uint32_t mask, const std::string &place) {
     if (mask == DEFAULT_PERMISSION)
@@ -223,11 +213,13 @@ void write_permission(source_writer &out, std::uint32_t mask, const std::string 
     no_source(place, "no permission letter stands for " + std::to_string(mask));
 }
 
-void write_action(source_writer &out, const kind_names &names, const cdb::action &action) {
+void write_action(source_writer &out, table from, const cdb::action &action) {
+    std::string_view stanza = side_table_of(from).stanza;
+    run_names names = runs_of(from);
     const rsrc_action_t &r = action.record();
-    std::string place = place_of(names.stanza, action.name());
+    std::string place = place_of(stanza, action.name());
     out.blank_line();
-    out.stanza(names.stanza, place);
+    out.stanza(stanza, place);
     out.line("Name", action.name());
     out.line("Description", r.ac_dscr_msgid);
     out.line("DisplayName", r.ac_disp_msgid);
@@ -261,34 +253,19 @@ void write_step(source_writer &out, const class_plan &plan, const step &s) {
     }
     case table::class_actions:
     case table::actions:
-        return write_action(out, kinds[static_cast<std::size_t>(s.from)], plan.view.actions(level_of(s.from))[s.index]);
+        return write_action(out, s.from, plan.view.actions(level_of(s.from))[s.index]);
     case table::inputs:
         out.blank_line();
-        return write_run(out, class_inputs[s.index].stanza, plan.view.sd_input(class_inputs[s.index].reference),
+        return write_run(out, class_inputs[s.index].stanza(), plan.view.sd_input(class_inputs[s.index].reference),
                          place_of("ResourceClass", plan.view.name()));
     }
 }
 
-std::vector<std::string> texts_of_pair(const cdb::valid_value &v) {
-    std::vector<std::string> texts;
-    for (const std::string &low : texts_of(v.low, true))
-        for (const std::string &high : texts_of(v.high, false))
-            texts.push_back(std::string(low).append(",").append(high));
-    return texts;
-}
-
 } // namespace
-
-void write_valid_values(source_writer &out, std::string_view name, const cdb::valid_value_list &values) {
-    for (const cdb::valid_value &v : values) {
-        out.line_of_any(name, is_same(v.low, v.high) ? texts_of(v.low, true) : texts_of_pair(v));
-        out.optional_line("ValueDisplayName", v.message, 0);
-    }
-}
 
 void write_steps(source_writer &out, const class_plan &plan) {
     for (const step &s : plan.order)
         write_step(out, plan, s);
 }
 
-} // namespace cdef
+} // namespace cdef::source

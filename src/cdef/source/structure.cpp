@@ -1,39 +1,15 @@
-/* structure.cpp: runs of SD stanzas, and what an attribute's value tells about the run that it came from.
- */
+/* structure.cpp: the runs of SD stanzas. */
 
-#include "cdef/source/source.h"
-#include "compare/compare.h"
+#include "cdef/source/structure.h"
+
+#include "cdef/source/error.h"
+#include "cdef/source/lists.h"
+#include "cdef/source/runs.h"
 #include "text/shown.h"
 
-namespace cdef {
+namespace cdef::source {
 
 namespace {
-
-constexpr std::uint16_t NO_INDEX = 0xFFFF;
-
-/* The types of a value's elements; of an array, of the structure in it. */
-struct element_types {
-    bool found = false; /* there is a value */
-    std::vector<vx_data_type_t> types;
-    bool defaults = true; /* the elements have the values that the compiler gives them */
-};
-
-bool has_default(vx_data_type_t type) {
-    return type != VX_UNKNOWN && type != VX_SBS_PTR;
-}
-
-element_types types_of(const cdb::value &value) {
-    if (!value.present())
-        return {};
-    if (value.type() == VX_SD_PTR_ARRAY)
-        return value.elements().size() == 1 ? types_of(value.elements()[0]) : element_types{true, {}, false};
-    element_types found = {.found = true, .types = {}};
-    for (const cdb::value &element : value.elements()) {
-        found.types.push_back(element.type());
-        found.defaults = found.defaults && has_default(element.type()) && is_default(element);
-    }
-    return found;
-}
 
 /* Both have as many elements. */
 bool same_types(const std::vector<vx_data_type_t> &types, const cdb::sd_definition &definition) {
@@ -41,29 +17,6 @@ bool same_types(const std::vector<vx_data_type_t> &types, const cdb::sd_definiti
         if (types[i] != definition[i].type())
             return false;
     return true;
-}
-
-/* How many elements of a run had an ElementIndex: the latest was highest, of which only 16 bits were kept. Nothing if
- * there were too few elements. */
-std::optional<std::size_t> indices_given(std::size_t elements, std::uint16_t highest) {
-    std::size_t given = (std::size_t{highest} + 1) & 0xFFFF;
-    if (given > elements)
-        return std::nullopt;
-    return given + (elements - given) / 0x10000 * 0x10000;
-}
-
-/* Which elements go without an ElementIndex: the last ones that can. Only an element that has one can have valid
- * values; of those there are at most as many as are given one. */
-std::vector<bool> indexed_elements(const cdb::sd_definition &definition, std::size_t given) {
-    std::vector<bool> indexed(definition.size(), true);
-    std::size_t without = definition.size() - given;
-    for (std::size_t i = definition.size(); i > 0 && without > 0; --i) {
-        if (definition[i - 1].valid_values().empty()) {
-            indexed[i - 1] = false;
-            --without;
-        }
-    }
-    return indexed;
 }
 
 /* Structured data have no structured data in them. Those that become a value have a type with a default, each. */
@@ -105,24 +58,13 @@ void write_indexed_run(source_writer &out, std::string_view stanza, const cdb::s
     }
 }
 
-/* A run of which nothing is left but the value that it made. */
+/* A run that the next one replaced: only the value that it made is left. */
 void write_replaced_run(source_writer &out, const attribute_structure &s, const element_types &value, std::size_t given,
                         const std::string &place) {
     out.comment("The next run replaces this one, but for the value.");
     for (std::size_t i = 0; i < value.types.size(); ++i)
         write_element(out, s.other_stanza, {"Replaced", value.types[i], 0, 0},
                       i < given ? std::optional(i) : std::nullopt, place);
-}
-
-std::size_t elements_with_valid_values(const cdb::sd_definition &definition) {
-    return static_cast<std::size_t>(std::count_if(definition.begin(), definition.end(),
-                                                  [](const cdb::sd_element &e) { return !e.valid_values().empty(); }));
-}
-
-/* The value and the highest index are those of a run like the definition. */
-bool fits_definition(const cdb::sd_definition &definition, const element_types &value, std::uint16_t highest) {
-    std::optional<std::size_t> given = indices_given(definition.size(), highest);
-    return value.types.size() == definition.size() && given && elements_with_valid_values(definition) <= *given;
 }
 
 std::size_t require_indices(std::size_t elements, std::uint16_t highest, const std::string &place) {
@@ -138,10 +80,10 @@ void write_own_run(source_writer &out, const attribute_structure &s, const eleme
     if (!same_types(value.types, s.definition))
         write_replaced_run(out, s, value, value.types.size(), place);
     std::size_t given = require_indices(s.definition.size(), s.highest_index, place);
-    write_indexed_run(out, s.stanza, s.definition, indexed_elements(s.definition, given), place);
+    write_indexed_run(out, s.stanza, s.definition, indexed_elements(with_valid_values(s.definition), given), place);
 }
 
-/* The value, if there is one, and the highest index are those of an earlier run. */
+/* The value, if there is one, and the highest index come from an earlier run. */
 void write_late_run(source_writer &out, const attribute_structure &s, const element_types &value,
                     const std::string &place) {
     if (value.found)
@@ -153,12 +95,6 @@ void write_late_run(source_writer &out, const attribute_structure &s, const elem
 }
 
 } // namespace
-
-bool comes_too_late(const cdb::sd_definition &definition, const cdb::value &value, std::uint16_t highest_index) {
-    if (definition.empty())
-        return false;
-    return !fits_definition(definition, types_of(value), highest_index);
-}
 
 void write_run(source_writer &out, std::string_view stanza, const cdb::sd_definition &definition,
                const std::string &place) {
@@ -183,4 +119,4 @@ void write_structure(source_writer &out, const attribute_structure &s, const std
         no_source(place, "its value is not of its definition");
 }
 
-} // namespace cdef
+} // namespace cdef::source

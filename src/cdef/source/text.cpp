@@ -1,18 +1,18 @@
 /* text.cpp: lines and values, written so that the compiler reads back what they were written for. */
 
-#include "cdef/source/source.h"
+#include "cdef/source/text.h"
+
 #include "text/append.h"
 #include "text/hex.h"
 #include "text/number.h"
-#include "text/shown.h"
 
 #include <cmath>
 
-namespace cdef {
+namespace cdef::source {
 
 namespace {
 
-constexpr std::size_t LINE_MAX_CHARS = 254;
+constexpr std::size_t LINE_MAX_CHARS = 254; /* what the compiler reads of a line at once */
 constexpr std::string_view BLANKS = " \t";
 
 /* Whether the compiler takes the whole line as text: no newline, no comment, nothing at the end that it removes. */
@@ -41,7 +41,7 @@ bool fits(std::string_view line) {
 
 /* ---- Values ---------------------------------------------------------------------------------------------------- */
 
-/* Decimal, but where that would count as an underflow, which the compiler remembers and holds against later zeros. */
+/* Decimal, except where that would count as an underflow: the compiler remembers it and refuses later zeros. */
 template <class Float> std::string text_of_real(Float number) {
     if (std::fpclassify(number) != FP_SUBNORMAL)
         return text::shortest(number);
@@ -57,7 +57,7 @@ std::vector<std::string> only(std::string text) {
     return texts;
 }
 
-/* How much of a binary's text stands for itself. */
+/* Which characters of a binary's text are written as they are. */
 enum class plain : std::uint8_t { printable, all };
 
 std::string escaped(std::byte b, plain which, bool in_pair) {
@@ -71,7 +71,7 @@ std::string escaped(std::byte b, plain which, bool in_pair) {
     return text;
 }
 
-/* The form with escapes is shorter, but its first four bytes are lost, and as many zeros follow at the end. */
+/* The form with escapes is shorter, but the compiler drops its first four bytes and adds as many zeros at the end. */
 std::string text_with_escapes(std::span<const std::byte> data, plain which, bool in_pair) {
     constexpr std::size_t LOST = 4;
     std::string text(LOST, '.');
@@ -176,47 +176,4 @@ bool is_default(const cdb::value &value) {
     }
 }
 
-/* ---- The writer ------------------------------------------------------------------------------------------------ */
-
-void source_writer::comment(std::string_view lines) {
-    for (std::size_t end = 0; end != std::string_view::npos;) {
-        end = lines.find('\n');
-        text += "# " + std::string(lines.substr(0, end)) + "\n";
-        lines.remove_prefix(end == std::string_view::npos ? lines.size() : end + 1);
-    }
-}
-
-void source_writer::blank_line() {
-    text += "\n";
-}
-
-void source_writer::stanza(std::string_view kind, std::string place) {
-    text += std::string(kind) + "\n";
-    current = std::move(place);
-}
-
-void source_writer::line(std::string_view name, std::string_view value) {
-    line_of_any(name, only(std::string(value)));
-}
-
-void source_writer::line(std::string_view name, std::int64_t number) {
-    line(name, std::to_string(number));
-}
-
-void source_writer::optional_line(std::string_view name, std::int64_t number, std::int64_t without) {
-    if (number != without)
-        line(name, number);
-}
-
-void source_writer::line_of_any(std::string_view name, const std::vector<std::string> &values) {
-    for (const std::string &value : values) {
-        if (std::optional<std::string> written = attribute_line(name, value)) {
-            text += *written + "\n";
-            return;
-        }
-    }
-    no_source(current, "no line can give its " + std::string(name) + " (" +
-                           (values.empty() ? "a value without a text" : text::quoted_ascii(values.front())) + ")");
-}
-
-} // namespace cdef
+} // namespace cdef::source

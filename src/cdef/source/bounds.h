@@ -1,0 +1,44 @@
+/* bounds.h: what the bounds of a dynamic attribute say about the Range line that they came from. */
+#ifndef CDGEN_CDEF_SOURCE_BOUNDS_H
+#define CDGEN_CDEF_SOURCE_BOUNDS_H
+
+#include "cdef/source/steps.h"
+
+namespace cdef::source {
+
+using cell = std::array<std::byte, sizeof(vx_value_t)>;
+
+/* The bytes that a line has to leave, in two cells or in the elements of two arrays of one. */
+struct wanted_bytes {
+    bool known = false;
+    bool in_arrays = false;
+    std::size_t width = 0; /* bytes that count */
+    cell low = {};
+    cell high = {};
+};
+
+/* What is known of an attribute's bounds. */
+struct range {
+    vx_data_type_t type;
+    bool takes_line;   /* a Range line is accepted and has an effect */
+    bool is_default;   /* the completion gives these bounds if no Range was given */
+    bool is_untouched; /* an attribute that was given nothing has these bounds */
+    bool has_none;     /* bounds are not kept, or cannot be seen */
+    wanted_bytes wanted;
+};
+
+/* What an open attribute's bounds hold so far. */
+enum class bounds : std::uint8_t { untouched, wanted, unwanted };
+
+/* Of a dynamic attribute. */
+range range_of(const class_plan &plan, const step &s);
+
+/* The value of a Range line that leaves these bytes if it is converted as this type; empty if there is none. */
+std::string line_value(const wanted_bytes &wanted, vx_data_type_t type);
+
+/* What such a line makes of the bounds of an attribute. */
+bounds after_line(const range &target, bounds before, vx_data_type_t type);
+
+} // namespace cdef::source
+
+#endif

@@ -1,0 +1,32 @@
+/* order.h: the order of a class's stanzas. */
+#ifndef CDGEN_CDEF_SOURCE_ORDER_H
+#define CDGEN_CDEF_SOURCE_ORDER_H
+
+#include "cdef/source/steps.h"
+
+namespace cdef::source {
+
+/* What a stanza left first. */
+struct traces {
+    std::uint32_t variety_list; /* offset; of a record */
+    std::uint32_t name;         /* offset in the strings */
+};
+
+/* A step, and what it left. */
+struct traced_step {
+    step what;
+    traces left;
+};
+
+/* The order of stanzas that left these traces. Records of a table keep their order. Those of different tables are mixed
+ * by their variety lists, each of which was made when its stanza began; inputs come between them by their names. */
+std::vector<step> order_of(const std::array<std::vector<traces>, RECORD_TABLES> &records,
+                           std::vector<traced_step> inputs);
+
+/* Sets order and ends_in_run of a plan: the order of the source that the database was made from, as far as it shows.
+ * The order matters little to a reader, but much to a Range, and for the same bytes. */
+void plan_order(class_plan &plan);
+
+} // namespace cdef::source
+
+#endif

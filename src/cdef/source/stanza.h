@@ -1,0 +1,15 @@
+/* stanza.h: the stanzas of attributes, actions and inputs of a class. */
+#ifndef CDGEN_CDEF_SOURCE_STANZA_H
+#define CDGEN_CDEF_SOURCE_STANZA_H
+
+#include "cdef/source/steps.h"
+#include "cdef/source/writer.h"
+
+namespace cdef::source {
+
+/* Writes the stanzas of a class in the order of its plan. What no line says throws no_source_error. */
+void write_steps(source_writer &out, const class_plan &plan);
+
+} // namespace cdef::source
+
+#endif

@@ -1,0 +1,120 @@
+/* steps.h: the stanzas of a class as steps, and what is planned of them before any is written. */
+#ifndef CDGEN_CDEF_SOURCE_STEPS_H
+#define CDGEN_CDEF_SOURCE_STEPS_H
+
+#include "cdb_view.h"
+#include "format/sections.h"
+#include "reader/ownership.h"
+
+#include <array>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace cdef::source {
+
+/* The tables of a class that have a stanza for each record, in the order of cdb::side_tables; those of attributes
+ * first. */
+enum class table : std::uint8_t {
+    persistent_class_attributes,
+    dynamic_class_attributes,
+    persistent_attributes,
+    dynamic_attributes,
+    class_actions,
+    actions,
+    inputs /* not a table: the class record's five inputs */
+};
+inline constexpr std::size_t RECORD_TABLES = 6;
+
+/* table: not inputs */
+constexpr const cdb::side_table &side_table_of(table t) {
+    return cdb::side_tables[static_cast<std::size_t>(t)];
+}
+static_assert(side_table_of(table::persistent_class_attributes).stanza == "PersistentClassAttribute");
+static_assert(side_table_of(table::dynamic_class_attributes).stanza == "DynamicClassAttribute");
+static_assert(side_table_of(table::persistent_attributes).stanza == "PersistentResourceAttribute");
+static_assert(side_table_of(table::dynamic_attributes).stanza == "DynamicResourceAttribute");
+static_assert(side_table_of(table::class_actions).stanza == "ClassAction");
+static_assert(side_table_of(table::actions).stanza == "ResourceAction");
+
+constexpr cdb::level level_of(table t) {
+    return t == table::persistent_class_attributes || t == table::dynamic_class_attributes || t == table::class_actions
+               ? cdb::level::of_class
+               : cdb::level::of_resource;
+}
+
+constexpr bool is_dynamic(table t) {
+    return t == table::dynamic_class_attributes || t == table::dynamic_attributes;
+}
+
+/* The stanza of a record, or a run of SD stanzas for an input of the class. */
+struct step {
+    table from;
+    std::size_t index;
+
+    bool operator==(const step &) const = default;
+};
+
+/* The inputs of a class, by their index in steps. */
+struct class_input {
+    std::size_t offset; /* of the reference in the class record */
+    cdb_ref_t rsrc_class_t::*reference;
+
+    constexpr std::string_view stanza() const {
+        return cdb::format_for<rsrc_class_t>.fact_at(offset).lines;
+    }
+};
+inline constexpr std::array<class_input, 5> class_inputs = {{
+    {offsetof(rsrc_class_t, u_rc_def_input), &rsrc_class_t::u_rc_def_input},
+    {offsetof(rsrc_class_t, u_rc_undef_input), &rsrc_class_t::u_rc_undef_input},
+    {offsetof(rsrc_class_t, u_rc_online_input), &rsrc_class_t::u_rc_online_input},
+    {offsetof(rsrc_class_t, u_rc_offline_input), &rsrc_class_t::u_rc_offline_input},
+    {offsetof(rsrc_class_t, u_rc_reset_input), &rsrc_class_t::u_rc_reset_input},
+}};
+
+/* What has to be known of a dynamic attribute before its stanza is written. */
+struct dynamic_plan {
+    std::string variable_class; /* empty: none */
+    std::string range;          /* the value of a Range line; empty: no line */
+};
+
+struct class_plan {
+    class_plan(const cdb::resource_class &of, const cdb::ownership &ownership) : view(of), owners(&ownership) {}
+
+    cdb::resource_class view;
+    const cdb::ownership *owners;
+    bool is_last = false; /* no class follows */
+    std::vector<step> order;
+    bool ends_in_run = false;                         /* the last step's run of SD stanzas ends the file */
+    std::array<std::vector<dynamic_plan>, 2> dynamic; /* by level */
+
+    std::vector<dynamic_plan> &of(cdb::level level) {
+        return dynamic[static_cast<std::size_t>(level)];
+    }
+    const std::vector<dynamic_plan> &of(cdb::level level) const {
+        return dynamic[static_cast<std::size_t>(level)];
+    }
+    std::size_t count(table of_records) const {
+        return view.record().*side_table_of(of_records).count;
+    }
+    /* Whether a field of a record leads to what is the record's own. */
+    bool owns(const step &record, std::size_t field_offset) const {
+        const cdb::side_table &t = side_table_of(record.from);
+        std::size_t at = (view.record().*t.ref).offset[0] + record.index * t.record->size;
+        return owners->is_own(view.side_tables().section, at + field_offset);
+    }
+    /* A class that follows in the source ends this one while the last attribute of each kind is still open: it is
+     * written as it is, without the checks and defaults of its completion. */
+    bool is_cut_short(const step &s) const {
+        return !is_last && s.from < table::class_actions && s.index + 1 == count(s.from);
+    }
+};
+
+/* All required lines can be given. Only then may optional ones follow. */
+template <class Record> bool is_complete(const cdb::attribute<Record> &attr) {
+    return attr.type() != VX_UNKNOWN && !attr.varieties().empty();
+}
+
+} // namespace cdef::source
+
+#endif

@@ -1,0 +1,26 @@
+/* text.h: lines and values, written so that the compiler reads back what they were written for. */
+#ifndef CDGEN_CDEF_SOURCE_TEXT_H
+#define CDGEN_CDEF_SOURCE_TEXT_H
+
+#include "cdb_view.h"
+
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace cdef::source {
+
+/* The line that gives an attribute a value, without its newline; nothing if no line does. */
+std::optional<std::string> attribute_line(std::string_view name, std::string_view value);
+
+/* The texts of a value that are worth trying, the best one first; none if it has no text. They all stand for the same
+ * value, but one may fit into a line where another does not. in_pair: the text must not contain a comma. */
+std::vector<std::string> texts_of(const cdb::value &value, bool in_pair);
+
+/* Whether the compiler gives this value to an attribute of its type if no line says otherwise. */
+bool is_default(const cdb::value &value);
+
+} // namespace cdef::source
+
+#endif

@@ -1,0 +1,52 @@
+/* writer.cpp: the text of a source in the making. */
+
+#include "cdef/source/writer.h"
+
+#include "cdef/source/error.h"
+#include "cdef/source/text.h"
+#include "text/shown.h"
+
+namespace cdef::source {
+
+void source_writer::comment(std::string_view lines) {
+    for (std::size_t end = 0; end != std::string_view::npos;) {
+        end = lines.find('\n');
+        text += "# " + std::string(lines.substr(0, end)) + "\n";
+        lines.remove_prefix(end == std::string_view::npos ? lines.size() : end + 1);
+    }
+}
+
+void source_writer::blank_line() {
+    text += "\n";
+}
+
+void source_writer::stanza(std::string_view kind, std::string place) {
+    text += std::string(kind) + "\n";
+    current = std::move(place);
+}
+
+void source_writer::line(std::string_view name, std::string_view value) {
+    line_of_any(name, std::vector{std::string(value)});
+}
+
+void source_writer::line(std::string_view name, std::int64_t number) {
+    line(name, std::to_string(number));
+}
+
+void source_writer::optional_line(std::string_view name, std::int64_t number, std::int64_t without) {
+    if (number != without)
+        line(name, number);
+}
+
+void source_writer::line_of_any(std::string_view name, const std::vector<std::string> &values) {
+    for (const std::string &value : values) {
+        if (std::optional<std::string> written = attribute_line(name, value)) {
+            text += *written + "\n";
+            return;
+        }
+    }
+    no_source(current, "no line can give its " + std::string(name) + " (" +
+                           (values.empty() ? "a value without a text" : text::quoted_ascii(values.front())) + ")");
+}
+
+} // namespace cdef::source

@@ -1,0 +1,40 @@
+/* The text of a source in the making. */
+
+#include "cdef/source/writer.h"
+
+#include "cdef/source/error.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using namespace cdef::source;
+
+TEST(SourceWriter, WritesStanzasAndLines) {
+    source_writer out;
+    out.stanza("ResourceClass", "ResourceClass 'C'");
+    out.line("Description", 5);
+    out.optional_line("GroupID", 255, 255);
+    out.blank_line();
+    out.comment("a\nb");
+    EXPECT_EQ(out.text, "ResourceClass\n\tDescription=5\n\n# a\n# b\n");
+}
+
+TEST(SourceWriter, TakesTheFirstTextThatFits) {
+    source_writer out;
+    out.line_of_any("Name", {"a\nb", "c", "d"});
+    EXPECT_EQ(out.text, "\tName=c\n");
+}
+
+TEST(SourceWriter, RefusesWhatNoLineSays) {
+    source_writer out;
+    out.stanza("ResourceClass", place_of("ResourceClass", "C"));
+    try {
+        out.line("Name", "");
+        FAIL();
+    } catch (const no_source_error &e) {
+        EXPECT_STREQ(e.what(), "no source: ResourceClass 'C': no line can give its Name ('')");
+    }
+}
+
+} // namespace

@@ -2,6 +2,8 @@
 
 #include "reader/attributes.h"
 
+#include "format/records.h"
+
 namespace cdb {
 
 static bool is_bound(const field &f) {
@@ -38,7 +40,7 @@ void attribute_walk::walk_attribute(const location &place, std::size_t offset, v
     auto record = tables.section.record<Record>(offset);
     out.visit<Record>(place, tables.section, offset);
     out.expect_id(place, "ra_cb_ID", record.ra_cb_ID, id);
-    references.expect_data_type(place, "ra_data_type", offsetof(Record, ra_data_type), record.ra_data_type);
+    references.expect_data_type(place, *format_for<Record>.type, record.ra_data_type);
     if constexpr (std::is_same_v<Record, rsrc_dattr_t>) {
         std::uint32_t mark = id == CDB_ID_DATTR_C ? VAR_ID_CLASS_ATTR : 0;
         dynamic_ids.push_back(static_cast<var_id_t>(record.ra_attr_id) | mark);

@@ -2,34 +2,13 @@
 
 #include "reader/references.h"
 
+#include "format/sections.h"
+
 #include <utility>
 
 namespace cdb {
 
-/* A kind of list. All three start with an identifier and a count. */
-struct list_format {
-    std::string_view record;
-    std::string_view id_field;
-    std::string_view count_field;
-    vx_uint32_t id;
-    std::size_t entry; /* bytes */
-    std::span<const field> fields;
-};
-
 namespace {
-
-constexpr std::size_t LIST_HEAD = 8; /* bytes */
-constexpr std::size_t LIST_COUNT = 4;
-static_assert(offsetof(variety_list_t, vl_values) == LIST_HEAD && offsetof(variety_list_t, vl_count) == LIST_COUNT);
-static_assert(offsetof(valid_values_t, vv_values) == LIST_HEAD && offsetof(valid_values_t, vv_count) == LIST_COUNT);
-static_assert(offsetof(sd_def_t, sd_fields) == LIST_HEAD && offsetof(sd_def_t, sd_count) == LIST_COUNT);
-
-constexpr list_format variety_format = {"variety_list_t",    "vl_cb_ID",         "vl_count",
-                                        CDB_ID_VARIETY_LIST, sizeof(vl_entry_t), variety_list_fields};
-constexpr list_format valid_values_format = {"valid_values_t",    "vv_cb_ID",         "vv_count",
-                                             CDB_ID_VALID_VALUES, sizeof(vv_entry_t), valid_values_fields};
-constexpr list_format sd_format = {"sd_def_t",    "sd_cb_ID",         "sd_count",
-                                   CDB_ID_SD_DEF, sizeof(sd_field_t), sd_def_fields};
 
 std::size_t in_file(const bytes &table, const bytes &section, const location &class_at) {
     return class_at.offset +
@@ -54,12 +33,11 @@ bool reference_walk::take_found_shared() {
 
 /* A source can leave an element's type unknown, and a following class an attribute's. Structured byte strings are
  * types, but have no values. */
-void reference_walk::expect_data_type(const location &place, std::string_view field, std::size_t offset,
-                                      vx_data_type_t type) {
+void reference_walk::expect_data_type(const location &place, const field &f, vx_data_type_t type) {
     if (!is_data_type(type))
-        out.report(check::DATA_TYPE, place, field, place.offset + offset, std::to_string(type), "0 to 22");
+        out.report(check::DATA_TYPE, place, f.name, place.offset + f.offset, std::to_string(type), "0 to 22");
     else if (type == VX_UNKNOWN || type == VX_SBS_PTR)
-        out.report(check::UNKNOWN_TYPE, place, field, place.offset + offset, std::string(name_of(type)),
+        out.report(check::UNKNOWN_TYPE, place, f.name, place.offset + f.offset, std::string(name_of(type)),
                    "a type with values");
 }
 
@@ -99,7 +77,7 @@ void reference_walk::follow_reference(const location &place, const field &f, std
 
 /* Where the entries of a list start, if there is a list and it has no other owner. */
 std::optional<std::size_t> reference_walk::find_list(const location &place, const field &ref, std::uint32_t offset,
-                                                     extent &lists, const list_format &format) {
+                                                     extent &lists, const list_kind &kind) {
     auto refuse = [&](check broken, std::string expected) {
         out.report(broken, place, ref.name, place.offset + ref.offset,
                    offset == CDB_NONE ? "none" : std::to_string(offset), std::move(expected));
@@ -111,16 +89,16 @@ std::optional<std::size_t> reference_walk::find_list(const location &place, cons
         return refuse(check::REFERENCE_OUTSIDE, "in " + std::to_string(lists.area.size()) + " bytes");
     if (offset % extent::UNIT != 0)
         return refuse(check::REFERENCE_UNALIGNED, "a multiple of 8");
-    location list_at = {section, format.record, offset, lists.offset + offset};
+    location list_at = {section, kind.head->record, offset, lists.offset + offset};
     std::size_t count = lists.area.number<std::uint32_t>(offset + LIST_COUNT);
-    std::size_t room = (lists.area.size() - offset - LIST_HEAD) / format.entry;
-    out.expect_id(list_at, format.id_field, lists.area.number<vx_uint32_t>(offset), format.id);
+    std::size_t room = (lists.area.size() - offset - LIST_HEAD) / kind.entry->size;
+    out.expect_id(list_at, kind.head->fields[0].name, lists.area.number<vx_uint32_t>(offset), kind.id);
     if (count > room) {
-        out.report(check::LIST_OUTSIDE, list_at, format.count_field, list_at.offset + LIST_COUNT, std::to_string(count),
-                   "at most " + std::to_string(room));
+        out.report(check::LIST_OUTSIDE, list_at, kind.head->fields[1].name, list_at.offset + LIST_COUNT,
+                   std::to_string(count), "at most " + std::to_string(room));
         return std::nullopt;
     }
-    if (claim_list(list_at, count, lists, format))
+    if (claim_list(list_at, count, lists, kind))
         return offset + LIST_HEAD;
     found_shared_list = true;
     return refuse(check::LIST_SHARED, "a list of its own");
@@ -128,38 +106,39 @@ std::optional<std::size_t> reference_walk::find_list(const location &place, cons
 
 /* Claims a list that lies inside its table; false if some of it has an owner. An empty list has room for one entry, if
  * the table has. */
-bool reference_walk::claim_list(const location &list_at, std::size_t count, extent &lists, const list_format &format) {
+bool reference_walk::claim_list(const location &list_at, std::size_t count, extent &lists, const list_kind &kind) {
     std::size_t first = list_at.index + LIST_HEAD;
-    std::size_t held = count == 0 && lists.area.size() - first >= format.entry ? 1 : count;
-    if (lists.claim(list_at.index, LIST_HEAD + held * format.entry) != extent::claim_result::FIRST)
+    std::size_t held = count == 0 && lists.area.size() - first >= kind.entry->size ? 1 : count;
+    if (lists.claim(list_at.index, LIST_HEAD + held * kind.entry->size) != extent::claim_result::FIRST)
         return false;
-    for (const field &f : format.fields.first(format.fields.size() - 1))
-        out.add_region(list_at, list_at.offset + f.offset, f.width, format.record, &f);
+    for (const field &f : kind.head->fields.first(kind.head->fields.size() - 1))
+        out.add_region(list_at, list_at.offset + f.offset, f.width, kind.head->record, &f);
     if (count < held) {
-        location room_at = {section, format.record, list_at.index, list_at.offset + LIST_HEAD};
-        out.expect_zero(room_at, "filling", lists.area, first, format.entry, room_at.offset);
-        out.add_region(room_at, room_at.offset, format.entry, "filling");
+        location room_at = {section, kind.head->record, list_at.index, list_at.offset + LIST_HEAD};
+        out.expect_zero(room_at, "filling", lists.area, first, kind.entry->size, room_at.offset);
+        out.add_region(room_at, room_at.offset, kind.entry->size, "filling");
     }
     return true;
 }
 
 void reference_walk::walk_varieties(const location &place, const field &ref, std::uint32_t offset) {
-    std::optional<std::size_t> first = find_list(place, ref, offset, variety_lists, variety_format);
+    std::optional<std::size_t> first =
+        find_list(place, ref, offset, variety_lists, list_kind_of(target::variety_lists));
     if (!first)
         return;
     auto count = variety_lists.area.number<std::uint32_t>(offset + LIST_COUNT);
-    location entry = {section, "vl_entry_t", 0, variety_lists.offset + *first};
+    location entry = {section, format_for<vl_entry_t>.record, 0, variety_lists.offset + *first};
     for (; entry.index < count; ++entry.index, entry.offset += sizeof(vl_entry_t))
         out.visit<vl_entry_t>(entry, variety_lists.area, entry.offset - variety_lists.offset);
 }
 
 void reference_walk::walk_valid_values(const location &place, const field &ref, std::uint32_t offset,
                                        vx_data_type_t type) {
-    std::optional<std::size_t> first = find_list(place, ref, offset, valid_vals, valid_values_format);
+    std::optional<std::size_t> first = find_list(place, ref, offset, valid_vals, list_kind_of(target::valid_vals));
     if (!first)
         return;
     auto count = valid_vals.area.number<std::uint32_t>(offset + LIST_COUNT);
-    location entry = {section, "vv_entry_t", 0, valid_vals.offset + *first};
+    location entry = {section, format_for<vv_entry_t>.record, 0, valid_vals.offset + *first};
     for (; entry.index < count; ++entry.index, entry.offset += sizeof(vv_entry_t)) {
         std::size_t in_table = entry.offset - valid_vals.offset;
         out.visit<vv_entry_t>(entry, valid_vals.area, in_table);
@@ -169,17 +148,17 @@ void reference_walk::walk_valid_values(const location &place, const field &ref, 
 
 /* Every element has a name. */
 void reference_walk::walk_sd_definition(const location &place, const field &ref, std::uint32_t offset) {
-    std::optional<std::size_t> first = find_list(place, ref, offset, sd_defs, sd_format);
+    std::optional<std::size_t> first = find_list(place, ref, offset, sd_defs, list_kind_of(target::sd_defs));
     if (!first)
         return;
     bool owner_may_be_unset = std::exchange(names_may_be_unset, false);
     auto count = sd_defs.area.number<std::uint32_t>(offset + LIST_COUNT);
-    location element = {section, "sd_field_t", 0, sd_defs.offset + *first};
+    location element = {section, format_for<sd_field_t>.record, 0, sd_defs.offset + *first};
     for (; element.index < count; ++element.index, element.offset += sizeof(sd_field_t)) {
         std::size_t in_table = element.offset - sd_defs.offset;
         auto type = sd_defs.area.number<vx_data_type_t>(in_table + offsetof(sd_field_t, sd_field_type));
         out.visit<sd_field_t>(element, sd_defs.area, in_table);
-        expect_data_type(element, "sd_field_type", offsetof(sd_field_t, sd_field_type), type);
+        expect_data_type(element, *format_for<sd_field_t>.type, type);
         follow(element, sd_defs.area, in_table, leading_fields_of<sd_field_t>, type);
     }
     names_may_be_unset = owner_may_be_unset;
@@ -200,9 +179,9 @@ void reference_walk::report_unreached(const extent &lists, std::string_view name
 }
 
 void reference_walk::report_unreached() {
-    report_unreached(variety_lists, "variety_list_t");
-    report_unreached(sd_defs, "sd_def_t");
-    report_unreached(valid_vals, "valid_values_t");
+    report_unreached(variety_lists, format_for<variety_list_t>.record);
+    report_unreached(sd_defs, format_for<sd_def_t>.record);
+    report_unreached(valid_vals, format_for<valid_values_t>.record);
 }
 
 } // namespace cdb

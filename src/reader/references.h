@@ -7,7 +7,7 @@
 
 namespace cdb {
 
-struct list_format;
+struct list_kind;
 
 class reference_walk {
 public:
@@ -21,7 +21,7 @@ public:
                 vx_data_type_t owner_type);
     void follow_field(const location &place, const field &f, std::uint32_t word, vx_data_type_t type);
     void walk_valid_values(const location &place, const field &ref, std::uint32_t offset, vx_data_type_t type);
-    void expect_data_type(const location &place, std::string_view field, std::size_t offset, vx_data_type_t type);
+    void expect_data_type(const location &place, const field &f, vx_data_type_t type);
 
     /* Reports the bytes in list tables that nothing refers to. A source can leave such lists. */
     void report_unreached();
@@ -38,8 +38,8 @@ public:
 private:
     void follow_reference(const location &place, const field &f, std::uint32_t word, vx_data_type_t type);
     std::optional<std::size_t> find_list(const location &place, const field &ref, std::uint32_t offset, extent &lists,
-                                         const list_format &format);
-    bool claim_list(const location &list_at, std::size_t count, extent &lists, const list_format &format);
+                                         const list_kind &kind);
+    bool claim_list(const location &list_at, std::size_t count, extent &lists, const list_kind &kind);
     void walk_varieties(const location &place, const field &ref, std::uint32_t offset);
     void walk_sd_definition(const location &place, const field &ref, std::uint32_t offset);
     void report_unreached(const extent &lists, std::string_view name);

@@ -2,11 +2,15 @@
 
 #include "reader/texts.h"
 
+#include "format/records.h"
+
 namespace cdb {
 
-/* The name of a record of which a class has many. */
-static bool is_name(const field &f) {
-    return f.name == "u_ra_name" || f.name == "u_ac_name" || f.name == "u_sd_field_name";
+/* The reference to the name of the record at this location. No source gives an error its name, so it may be anything.
+ */
+static bool is_name(const location &at, const field &ref) {
+    const record_format &record = format_of(at.record);
+    return record.name != nullptr && record.name->offset == ref.offset && &record != &format_for<rsrc_error_t>;
 }
 
 void text_walk::visit(const location &at, const field &ref, std::uint32_t offset, bool may_be_unset) {
@@ -21,7 +25,7 @@ void text_walk::visit(const location &at, const field &ref, std::uint32_t offset
     else if (offset >= strings.texts_end)
         out.report(check::TEXT_OUTSIDE, at, ref.name, place, std::to_string(offset),
                    "a text in " + std::to_string(strings.area.size()) + " bytes");
-    else if (offset == 0 && (!is_name(ref) || may_be_unset))
+    else if (offset == 0 && (!is_name(at, ref) || may_be_unset))
         is_first_referred_to = true;
     else if (strings.is_text(offset))
         out.report(check::VALUE_SHARED, at, ref.name, place, std::to_string(offset), "a text of its own");

@@ -1,4 +1,4 @@
-/* view.cpp: what of the reader does not stand in its header. */
+/* view.cpp: the parts of the views that are not in their header. */
 
 #include "cdb_view.h"
 
@@ -24,7 +24,7 @@ std::error_code system_error() {
     return {errno != 0 ? errno : EIO, std::generic_category()};
 }
 
-/* The order in which the format word is the format word. */
+/* The byte order in which the format word reads as it must. */
 std::optional<std::endian> order_of(std::span<const std::byte> file) {
     for (std::endian order : {std::endian::little, std::endian::big})
         if (bytes(file, order).number<std::uint32_t>(offsetof(orb_cdb_header_t, cdb_hdr_format)) == CDB_FORMAT)
@@ -34,8 +34,8 @@ std::optional<std::endian> order_of(std::span<const std::byte> file) {
 
 constexpr std::size_t STEP = 65536; /* bytes read at a time */
 
-/* Asks for large pages for as much of a stretch as they fit into: giving it in small ones takes the system longer than
- * filling it. */
+/* Asks for large pages wherever they fit into a stretch: the system takes longer to hand out small ones than the caller
+ * to fill them. */
 void advise_large_pages([[maybe_unused]] std::byte *start, [[maybe_unused]] std::size_t size) {
 #ifdef MADV_HUGEPAGE
     constexpr std::size_t LARGE_PAGE = 2097152;
@@ -45,8 +45,8 @@ void advise_large_pages([[maybe_unused]] std::byte *start, [[maybe_unused]] std:
 #endif
 }
 
-/* In one piece if the file tells its size; but its end decides. In steps, whose bytes are still in the nearest cache
- * when they are read into. */
+/* Reads until the end of the file, whatever its size was said to be; with the right size, no byte is moved. The steps
+ * are small so that their new bytes, zero at first, are still in the nearest cache when they are read into. */
 std::vector<std::byte> read_all(std::FILE *file, std::size_t expected) {
     std::vector<std::byte> contents;
     contents.reserve(expected + STEP);

@@ -1,4 +1,4 @@
-"""Ask each subcommand whose a list of valid values is, where the reference does not say.
+"""Ask each subcommand whose a list of valid values or a bound is, where the reference does not say.
 
 An attribute that a following class cuts short refers to the first list of
 valid values, whether it has that list or none.  Each case is a class that
@@ -9,6 +9,9 @@ have to agree:
     dump      shows valid values with their owner, and with nobody else
     source    writes them in their owner's stanza
     diff      adds them to their owner, compared to the class without them
+
+A bound may be a number of another type and lead anywhere: the images of
+tests/image/broken, changes to small.image, have such bounds.
 """
 
 import dataclasses
@@ -265,3 +268,32 @@ def test_all_subcommands_name_the_owner(name, options, directory):
     programs.compile([re.sub(r"\tValid\w*Value=.*\n", "", text) for text in case.stanzas], "without.cdef", *options)
     added = "".join(f"+ ResourceClass 'First', {line}\n" for line in case.diff)
     same(programs.cdef("diff", "without.cdef", "made.cdef"), added, "diff")
+
+
+# The bounds of d0, an array of texts, as dump shows them in small.image: an array with one text each, which is none.
+ONE_NONE = ["StringArray", "String: none"]
+
+# By the name of an image: the bounds that dump shows, and what diff says of the change.
+BOUNDS = {
+    "CDB452-bound-of-another-owner": ([*ONE_NONE, "none"], "upper bound [nothing] -> misplaced 192"),
+    "CDB452-lower-bound": (["none", *ONE_NONE], "lower bound [nothing] -> misplaced 193"),
+    "CDB452-text-in-a-bound": ([*ONE_NONE, *ONE_NONE], "lower bound [nothing] -> [misplaced 24]"),
+}
+
+
+def bounds_in(listing):
+    """What a listing says of the bounds of d0."""
+    start = listing.index('dynamic resource attribute "d0"')
+    found = re.search(r"ra_min_value: (.*?)\n *u_ra_variety_list", listing[start:], re.DOTALL)
+    return re.sub(r"ra_max_value: ", "", found[1]).split("\n")
+
+
+@pytest.mark.parametrize("order", ("little", "big"))
+@pytest.mark.parametrize("name", BOUNDS)
+def test_dump_and_diff_take_a_bound_for_none(name, order, directory):
+    """If verify says that it is not the attribute's own."""
+    shown, changed = BOUNDS[name]
+    programs = Programs(directory)
+    before, after = PROGRAMS.images / f"small.{order}.cdef", PROGRAMS.images / f"broken/{name}.{order}.cdef"
+    same([line.strip() for line in bounds_in(programs.cdef("dump", after))], shown, "dump")
+    same(programs.cdef("diff", before, after), f"~ DynamicResourceAttribute 'd0': {changed}\n", "diff")

@@ -1,7 +1,7 @@
 /* notes.cpp: what helps to understand an error: the name that was meant, where a thing was first given, what
  * is missing. */
 
-#include "check/session.h"
+#include "check/recovery.h"
 
 #include <bit>
 #include <cstdlib>

@@ -1,6 +1,6 @@
 /* numbers.cpp: numbers that the compiler takes otherwise than they were meant. */
 
-#include "check/session.h"
+#include "check/recovery.h"
 
 #include <algorithm>
 #include <cerrno>

@@ -20,7 +20,7 @@ from expectation import Expectation
 from programs import PROGRAMS, PROJECT, TESTS
 
 CASES = TESTS / "cdef/check"
-TABLE = "src/check/messages.cpp"
+TABLE = "src/check/warnings/registry.cpp"
 WARNING_ROW = re.compile(r'\{[A-Z_]+, "(S\d{3})", "([a-z-]+)",\s*"((?:[^"\\]|\\.)+)"\}')
 
 

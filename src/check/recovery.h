@@ -1,6 +1,6 @@
 /* session.h: one check of one source: the compilation that it drives, and what it remembers of it. */
-#ifndef CDGEN_CDEF_CHECK_SESSION_H
-#define CDGEN_CDEF_CHECK_SESSION_H
+#ifndef CDGEN_CDEF_CHECK_RECOVERY_H
+#define CDGEN_CDEF_CHECK_RECOVERY_H
 
 #include "check/check.h"
 

@@ -1,7 +1,7 @@
 /* run.cpp: drives a compilation over a source, and goes on behind each error so that one mistake is told
  * once. Up to the first error nothing is done that the compiler would not do. */
 
-#include "check/session.h"
+#include "check/recovery.h"
 
 #include "cdef/support/trouble.h"
 

@@ -1,6 +1,6 @@
 /* recover.cpp: what goes on behind an error, so that one mistake is told once. */
 
-#include "check/session.h"
+#include "check/recovery.h"
 
 #include <algorithm>
 

@@ -1,6 +1,6 @@
 /* lines.cpp: texts, and the lines that gave them first. */
 
-#include "check/session.h"
+#include "check/recovery.h"
 
 #include <algorithm>
 #include <utility>

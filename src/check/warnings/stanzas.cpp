@@ -1,6 +1,6 @@
 /* warn.cpp: what the compiler takes without a word, though hardly anybody means it. */
 
-#include "check/session.h"
+#include "check/recovery.h"
 
 #include <algorithm>
 #include <utility>

@@ -265,7 +265,8 @@ struct source_file {
 
     void close();
 
-    int fd = -1;
+    int fd = -1;             /* -1: the source is in memory */
+    std::string_view memory; /* of such a source, what has not been read */
     dev_t device = 0;
     ino_t inode = 0;
     size_t pos = 0;           /* of the first byte of buffer not yet taken */

@@ -19,21 +19,33 @@ char *next_mark(char *from) {
     return from + strcspn(from, "\"#/");
 }
 
-/* Moves a line's beginning to the front of the buffer and reads what follows; false at the end of the file. */
-bool refill(cdgen &cx) {
+/* Copies up to `room` bytes of the source; 0 at its end. */
+size_t read_some(cdgen &cx, char *to, size_t room) {
     source_file &source = cx.cdb_fp;
-    size_t begun = source.end - source.pos;
-    memmove(source.buffer.data(), source.buffer.data() + source.pos, begun);
+    if (source.fd < 0) {
+        size_t copied = source.memory.copy(to, room);
+        source.memory.remove_prefix(copied);
+        return copied;
+    }
     ssize_t n = 0;
     do
-        n = read(source.fd, source.buffer.data() + begun, SOURCE_BUFFER - begun);
+        n = read(source.fd, to, room);
     while (n < 0 && errno == EINTR);
     if (n < 0) {
         int error = errno;
         cdgen_error_exit(MSG_CANNOT_READ, cx.cdefsrc, strerror(error), 0, error);
     }
+    return static_cast<size_t>(n);
+}
+
+/* Moves a line's beginning to the front of the buffer and reads what follows; false at the end of the source. */
+bool refill(cdgen &cx) {
+    source_file &source = cx.cdb_fp;
+    size_t begun = source.end - source.pos;
+    memmove(source.buffer.data(), source.buffer.data() + source.pos, begun);
+    size_t n = read_some(cx, source.buffer.data() + begun, SOURCE_BUFFER - begun);
     source.pos = 0;
-    source.end = begun + static_cast<size_t>(n);
+    source.end = begun + n;
     source.buffer[source.end] = '\0';
     source.mark = next_mark(source.buffer.data());
     return n > 0;
@@ -215,6 +227,12 @@ void take_source(cdgen &cx, const char *filename, int fd) {
         cdgen_error_exit(MSG_CANNOT_OPEN, filename, strerror(errno), 0, errno);
     source.device = st.st_dev;
     source.inode = st.st_ino;
+    cx.table_id = -1;
+}
+
+void take_source(cdgen &cx, std::string_view bytes) {
+    cx.cdb_fp.close();
+    cx.cdb_fp.memory = bytes;
     cx.table_id = -1;
 }
 

@@ -17,6 +17,9 @@ void open_source(cdgen &cx, const char *filename);
 /* The same for a descriptor that is open, or -1 with errno; it is the context's from now on. */
 void take_source(cdgen &cx, const char *filename, int fd);
 
+/* The same for a source in memory, which must stay until it has been read. */
+void take_source(cdgen &cx, std::string_view bytes);
+
 /* The next line, or the next 254 characters of a longer one, and counts it. It stays until the next call. */
 source_line next_line(cdgen &cx);
 

@@ -32,6 +32,10 @@ void stepwise_compiler::open(int fd) {
     take_source(cx, cx.cdefsrc, fd);
 }
 
+void stepwise_compiler::open_bytes(std::string_view bytes) {
+    take_source(cx, bytes);
+}
+
 source_line stepwise_compiler::next_line() {
     return ::next_line(cx);
 }

@@ -16,6 +16,8 @@ public:
     void open();
     /* The same for a descriptor that is open, or -1 with errno; it is closed with the source. */
     void open(int fd);
+    /* The same for a source in memory, which must stay until it has been read. */
+    void open_bytes(std::string_view bytes);
     source_line next_line();
     void close();
 

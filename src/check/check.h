@@ -1,22 +1,21 @@
-/* check.h: what the files of "cdef check" share. It drives the compiler's own modules over a source, line by line,
- * and catches what would end the compilation; no other part of cdef knows the compiler. */
-#ifndef CDGEN_CDEF_CHECK_H
-#define CDGEN_CDEF_CHECK_H
-
-#include "compiler/stepwise.h"
-#include "language/suggestions.h"
+/* check.h: checks a source: bytes in, findings with positions out. It drives the compiler over the source line by line,
+ * catches what would end a compilation, and continues after it. */
+#ifndef CDGEN_CHECK_CHECK_H
+#define CDGEN_CHECK_CHECK_H
 
 #include <array>
-#include <span>
+#include <cstddef>
+#include <functional>
 #include <stdexcept>
 #include <string>
 #include <string_view>
 #include <vector>
 
-namespace cdef::check {
+namespace check {
 
-/* ---- Warnings (messages.cpp) ----------------------------------------------------------------------- */
+/* ---- Warnings (warnings/registry.cpp) --------------------------------------------------------------------------- */
 
+/* In the order of the codes. */
 enum warning_id {
     SD_RUN_AT_END,
     SD_WITHOUT_RUN,
@@ -43,78 +42,64 @@ enum warning_id {
 
 struct warning {
     warning_id id;
-    const char *code; /* for ever, as is */
-    const char *name; /* which switches it */
+    const char *code; /* permanent */
+    const char *name; /* switches it on and off; permanent too */
     const char *title;
+    const char *cause; /* sentences; `names of the language` are in backquotes */
+    const char *cure;
 };
 
+/* All of them; warnings[id] is the one with that id. */
 extern const std::array<warning, WARNING_COUNT> warnings;
 
+/* By id: whether the warning is wanted. */
 using warning_set = std::array<bool, WARNING_COUNT>;
 
-/* ---- Findings ------------------------------------------------------------------------------------------------- */
+/* ---- Findings --------------------------------------------------------------------------------------------------- */
 
-/* Where: a line as the compiler counts it, 0 for none, and bytes of it, column 0 for the whole line. */
+/* A part of a line. */
 struct place {
-    int line = 0;
-    size_t column = 0; /* from 1 */
-    size_t length = 0;
+    int line = 0;      /* as the compiler counts lines; 0: none */
+    size_t column = 0; /* in bytes, from 1; 0: the whole line */
+    size_t length = 0; /* in bytes */
 };
 
 struct note {
     place at;
     std::string text;
-    std::string source = {}; /* the line, if it is to be shown: the finding itself has no place in it */
+    std::string source = {}; /* the line, where it has to be shown because the finding has no place in it */
 };
 
 struct finding {
     bool error = true;
     const char *code = "";
-    const char *name = "error"; /* a warning's */
+    const char *name = "error"; /* that of a warning */
     std::string text;
     place at;
     std::string source; /* the line */
     std::vector<note> notes;
 };
 
-struct result {
-    std::string file;
-    std::vector<finding> findings; /* by line, its errors first, in the order in which they were met */
+struct totals {
     size_t errors = 0;
     size_t warnings = 0;
 };
 
-/* Checks one source; "-" is standard input. Throws cdef::trouble when it cannot be read, or when memory runs out. */
-result check_source(const std::string &path, const warning_set &wanted);
+/* Is given each finding, by line; the errors of a line come before its warnings. */
+using sink = std::function<void(finding &&)>;
 
-/* ---- Names (names.cpp) ----------------------------------------------------------------------------- */
+/* The source cannot be read, or memory ran out. The text names the source. */
+struct cannot_check : std::runtime_error {
+    using std::runtime_error::runtime_error;
+};
 
-using language::listed;
-using language::name_list;
-using language::near_miss;
-using language::quoted;
-using language::suggestion;
+/* Checks a source that is in memory. Its name appears in cannot_check only, which is thrown if memory
+ * runs out. */
+totals check_bytes(std::string_view bytes, const std::string &name, const warning_set &wanted, const sink &to);
 
-name_list stanza_names();
-name_list attribute_names(const srtable_ctrl &kind);
+/* Checks a file; "-" is standard input. It is read in portions. Throws cannot_check. */
+totals check_file(const std::string &path, const warning_set &wanted, const sink &to);
 
-/* The stanza kinds that have an attribute of this name, as bits. */
-vx_uint32_t kinds_with(std::string_view name);
-
-name_list property_names(int attr_type);
-
-/* The required attributes of a kind that a mask lacks. */
-name_list missing_names(const srtable_ctrl &kind, vx_uint32_t mask);
-
-/* ---- Forms (report/text.cpp, report/json.cpp) -------------------------------------------------------------
- */
-
-/* As compilers write it: a line for each finding and note, and the line of the source with a mark. Nothing of a source,
- * or of its name, can steer a terminal: a '?' stands for each character that might. */
-std::string as_text(const result &checked);
-std::string as_json(std::span<const result> checked);
-std::string as_sarif(std::span<const result> checked);
-
-} // namespace cdef::check
+} // namespace check
 
 #endif

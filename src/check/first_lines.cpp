@@ -1,11 +1,11 @@
-/* lines.cpp: texts, and the lines that gave them first. */
+/* first_lines.cpp: an open hash table of texts. */
 
-#include "check/recovery.h"
+#include "check/first_lines.h"
 
 #include <algorithm>
 #include <utility>
 
-namespace cdef::check {
+namespace check {
 
 size_t first_lines::slot_of(std::string_view text, unsigned tag) const {
     size_t mask = slots.size() - 1;
@@ -30,7 +30,7 @@ void first_lines::grow() {
     }
 }
 
-int &first_lines::of(std::string_view text, unsigned tag) {
+int &first_lines::line_of(std::string_view text, unsigned tag) {
     if (2 * entries.size() >= slots.size())
         grow();
     slot &found = slots[slot_of(text, tag)];
@@ -46,8 +46,8 @@ bool first_lines::has(std::string_view text) const {
     return !slots.empty() && slots[slot_of(text, tag_of(text))].position != 0;
 }
 
-name_list first_lines::all() const {
-    name_list names;
+std::vector<std::string_view> first_lines::all() const {
+    std::vector<std::string_view> names;
     for (size_t position = 1; position <= entries.size(); ++position)
         names.push_back(text_of(position));
     return names;
@@ -61,4 +61,4 @@ void first_lines::clear() {
     std::fill(slots.begin(), slots.end(), slot{0, 0});
 }
 
-} // namespace cdef::check
+} // namespace check

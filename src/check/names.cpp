@@ -1,8 +1,12 @@
-/* names.cpp: the names that the catalogue of stanzas knows. */
+/* names.cpp: what the catalogue of stanzas says about names. */
 
-#include "check/check.h"
+#include "check/names.h"
 
-namespace cdef::check {
+#include <span>
+
+namespace check {
+
+using language::name_list;
 
 namespace {
 
@@ -29,11 +33,10 @@ name_list attribute_names(const srtable_ctrl &kind) {
     return names;
 }
 
-vx_uint32_t kinds_with(std::string_view name) {
-    vx_uint32_t kinds = 0;
+kind_set kinds_with(std::string_view name) {
+    kind_set kinds;
     for (int kind = 0; kind < SC_COUNT; ++kind)
-        if (find_attr(sc_tables[static_cast<size_t>(kind)], name) != nullptr)
-            kinds |= 1u << kind;
+        kinds[index_of(kind)] = find_attr(table_of(kind), name) != nullptr;
     return kinds;
 }
 
@@ -58,4 +61,4 @@ name_list missing_names(const srtable_ctrl &kind, vx_uint32_t mask) {
     return names;
 }
 
-} // namespace cdef::check
+} // namespace check

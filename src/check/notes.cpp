@@ -1,14 +1,21 @@
-/* notes.cpp: what helps to understand an error: the name that was meant, where a thing was first given, what
- * is missing. */
+/* notes.cpp: what helps to understand an error. */
 
-#include "check/recovery.h"
+#include "check/notes.h"
 
-#include <bit>
+#include "check/names.h"
+#include "check/numbers.h"
+
+#include <algorithm>
 #include <cstdlib>
 
-namespace cdef::check {
+namespace check {
 
 namespace {
+
+using language::listed;
+using language::near_miss;
+using language::quoted;
+using language::suggestion;
 
 const char *form_of(vx_data_type_t type) {
     switch (scalar_vx(type)) {
@@ -32,63 +39,69 @@ const char *form_of(vx_data_type_t type) {
 
 /* One error while its notes are added. */
 struct noting {
-    session &check;
+    const view &see;
     finding &found;
-    const fatal_exit &failure;
-    int kind; /* of the stanza at fault; -1: none */
+    int kind; /* of the stanza at fault */
 
     void add(const place &at, std::string text) {
         found.notes.push_back({at, std::move(text)});
+    }
+    void add_here(std::string text) {
+        add(found.at, std::move(text));
     }
     /* For an error without a place of its own: the line is shown. */
     void show(const mention &shown, std::string text) {
         found.notes.push_back({shown.at, std::move(text), shown.source});
     }
-    mention header() const {
-        return {stanza().header, {}, stanza().source};
-    }
     void first_given(int line) {
         if (line != 0)
             add({line, 0, 0}, "first given here");
     }
-    const srtable_ctrl &table() const {
-        return sc_tables[index_of(kind)];
+    void show_missing() {
+        show({stanza().header, {}, stanza().source}, "this " + kind_name() + " lacks " + listed(missing()));
     }
-    const stanza_note &stanza() const {
-        return check.stanzas[index_of(kind)];
+
+    std::string kind_name() const {
+        return quoted(table_of(kind).sc_name);
     }
-    name_list missing() const {
-        return missing_names(table(), check.compiler.required_seen(kind));
+    const stanza_record &stanza() const {
+        return see.known.stanzas[index_of(kind)];
+    }
+    language::name_list missing() const {
+        return see.compiler.missing(kind);
     }
     std::string marked() const {
-        return check.raw.substr(found.at.column - 1, found.at.length);
+        return std::string(see.line.at(found.at));
     }
 };
 
 /* The only kind that has the attribute. */
-std::string belongs_to(vx_uint32_t kinds) {
-    const char *name = sc_tables[static_cast<size_t>(std::countr_zero(kinds))].sc_name;
-    return "it is an attribute of " + quoted(name) + ", whose header may be missing";
+std::string belongs_to(const kind_set &kinds) {
+    int kind = 0;
+    while (!kinds.test(index_of(kind)))
+        ++kind;
+    return "it is an attribute of " + quoted(table_of(kind).sc_name) + ", whose header may be missing";
 }
 
 void no_stanza(noting &n) {
     std::string text = n.marked();
-    vx_uint32_t kinds = kinds_with(std::string_view(text).substr(0, text.find('=')));
-    if (std::has_single_bit(kinds))
-        n.add(n.found.at, belongs_to(kinds));
+    kind_set kinds = kinds_with(std::string_view(text).substr(0, text.find('=')));
+    if (kinds.count() == 1)
+        n.add_here(belongs_to(kinds));
 }
 
 void unknown_name(noting &n) {
     std::string given = n.marked();
-    if (given.ends_with(' ') || given.ends_with('\t'))
-        if (find_attr(n.table(), std::string_view(given).substr(0, given.find_last_not_of(" \t") + 1)) != nullptr)
-            return n.add(n.found.at, "blanks in front of the = belong to the name");
-    vx_uint32_t others = kinds_with(given);
-    name_list known = attribute_names(n.table());
-    if (near_miss(given, known).empty() && std::has_single_bit(others))
-        n.add(n.found.at, belongs_to(others));
+    const srtable_ctrl &table = table_of(n.kind);
+    std::string_view trimmed = std::string_view(given).substr(0, given.find_last_not_of(" \t") + 1);
+    if (trimmed.size() < given.size() && find_attr(table, trimmed) != nullptr)
+        return n.add_here("blanks in front of the = belong to the name");
+    kind_set others = kinds_with(given);
+    language::name_list known = attribute_names(table);
+    if (near_miss(given, known).empty() && others.count() == 1)
+        n.add_here(belongs_to(others));
     else
-        n.add(n.found.at, suggestion(given, known));
+        n.add_here(suggestion(given, known));
 }
 
 void too_early(noting &n) {
@@ -99,97 +112,95 @@ void too_early(noting &n) {
 }
 
 void repeated(noting &n) {
-    auto at = static_cast<size_t>(n.check.latest.attr - n.table().sc_attrs.data());
+    auto at = static_cast<size_t>(&n.see.attr() - table_of(n.kind).sc_attrs.data());
     n.first_given(n.stanza().given[at]);
 }
 
 void no_sd_attribute(noting &n) {
-    n.add(n.found.at, "it must follow an attribute whose DataType is `SD` or `SDArray` at once");
+    n.add_here("it must follow an attribute whose DataType is `SD` or `SDArray` at once");
 }
 
 void incomplete(noting &n) {
-    n.show(n.header(), "this " + quoted(n.table().sc_name) + " lacks " + listed(n.missing()));
+    n.show_missing();
 }
 
 void no_class(noting &n) {
-    n.add(n.found.at, "`ControlDefinition` begins a class, and must stand in front");
+    n.add_here("`ControlDefinition` begins a class, and must stand in front");
 }
 
 void second_map(noting &n) {
-    n.first_given(n.check.map_line);
+    n.first_given(n.see.known.map_line);
 }
 
 void unknown_property(noting &n) {
-    n.add(n.found.at, suggestion(n.marked(), property_names(n.check.latest.attr->ta_type)));
+    n.add_here(suggestion(n.marked(), property_names(n.see.attr().ta_type)));
 }
 
 void unknown_type(noting &n) {
-    n.add(n.found.at, language::type_suggestion(n.marked(), false));
+    n.add_here(language::type_suggestion(n.marked(), false));
 }
 
 void unknown_variable_type(noting &n) {
-    n.add(n.found.at, suggestion(n.marked(), language::variable_type_names()));
+    n.add_here(suggestion(n.marked(), language::variable_type_names()));
 }
 
 void overflowed(noting &n) {
-    n.add({n.check.overflow_line, 0, 0},
+    n.add({n.see.known.overflow_line, 0, 0},
           "the number that overflows here makes later ones that are 0, or the limit of their type, invalid");
-    n.check.overflow_told = true;
 }
 
 void bad_value(noting &n) {
-    session &check = n.check;
-    vx_data_type_t type = check.compiler.data_type();
-    bool numeric = scalar_vx(type) >= VX_INT32 && scalar_vx(type) <= VX_FLOAT64;
-    if (numeric && check.overflow_line != 0)
+    vx_data_type_t type = n.see.compiler.data_type();
+    const mention &given_type = n.stanza().data_type;
+    if (is_numeric(type) && n.see.known.overflow_line != 0)
         overflowed(n);
     else if (type == VX_UNKNOWN)
-        n.add(n.stanza().data_type.at,
-              "unknown data type: " + language::type_suggestion(n.stanza().data_type.text, true));
+        n.add(given_type.at, "unknown data type: " + language::type_suggestion(given_type.text, true));
     else
-        n.add(n.found.at, quoted(vxTypeStr[type]) + " takes " + form_of(type));
+        n.add_here(quoted(vxTypeStr[type]) + " takes " + form_of(type));
+}
+
+bool is_expected_index(const finding &found, const view &see) {
+    std::string text(see.line.at(found.at));
+    return std::strtol(text.c_str(), nullptr, 10) == see.compiler.expected_index();
 }
 
 void wrong_index(noting &n) {
-    session &check = n.check;
-    int expected = check.compiler.expected_index();
-    bool as_expected = std::strtol(n.marked().c_str(), nullptr, 10) == expected;
-    if (check.overflow_line != 0 && as_expected)
+    if (n.see.known.overflow_line != 0 && is_expected_index(n.found, n.see))
         overflowed(n);
     else
-        n.add(n.found.at, "expected is " + std::to_string(expected));
-    if (check.index_missing != 0)
-        n.add({check.index_missing, 0, 0}, "this " + quoted(n.table().sc_name) + " lacks `ElementIndex`");
+        n.add_here("expected is " + std::to_string(n.see.compiler.expected_index()));
+    if (int line = n.see.known.run.without_index; line != 0)
+        n.add({line, 0, 0}, "this " + n.kind_name() + " lacks `ElementIndex`");
 }
 
 void bad_default(noting &n) {
     if (!is_sd_kind(n.kind))
-        n.show(n.stanza().data_type, "the DataType of this " + quoted(n.table().sc_name));
-    else
-        for (const mention &odd : n.check.odd_elements)
-            n.show(odd, odd.text == "SBS" ? "the element's DataType" : language::type_suggestion(odd.text, true));
+        return n.show(n.stanza().data_type, "the DataType of this " + n.kind_name());
+    for (const mention &odd : n.see.known.run.odd_types)
+        n.show(odd, odd.text == "SBS" ? "the element's DataType" : language::type_suggestion(odd.text, true));
 }
 
 void no_manager(noting &n) {
     n.kind = SC_CLASS_TO_MANAGER_MAPPING;
-    n.show(n.header(), "this `ClassToManagerMapping` lacks `ResourceManager`");
+    n.show({n.stanza().header, {}, n.stanza().source}, "this `ClassToManagerMapping` lacks `ResourceManager`");
 }
 
 void keys(noting &n) {
     n.kind = SC_CLASS_TO_MANAGER_MAPPING;
     for (const char *key : {"FirstKey", "LastKey"})
-        if (const mention *given = n.check.map_value(key))
+        if (const mention *given = map_value(n.see.known, key))
             n.show(*given, given->text + " is given here");
         else
-            incomplete(n);
+            n.show_missing();
 }
 
-struct noting_of {
+struct notes_of {
     message_id id;
     void (*add)(noting &);
 };
 
-constexpr noting_of notings[] = {
+constexpr notes_of table[] = {
     {MSG_NO_STANZA, no_stanza},
     {MSG_UNKNOWN_ATTRIBUTE, unknown_name},
     {MSG_OPTIONAL_TOO_EARLY, too_early},
@@ -217,11 +228,25 @@ constexpr noting_of notings[] = {
 
 } // namespace
 
-void session::add_notes(finding &found, const fatal_exit &failure, int failed_kind) {
-    noting n = {*this, found, failure, failed_kind};
-    for (const noting_of &each : notings)
+void add_notes(finding &found, const fatal_exit &failure, int kind, const view &see) {
+    noting n = {see, found, kind};
+    for (const notes_of &each : table)
         if (each.id == failure.id)
             each.add(n);
 }
 
-} // namespace cdef::check
+bool blames_overflow(const finding &found, const fatal_exit &failure, const view &see) {
+    if (see.known.overflow_line == 0)
+        return false;
+    if (failure.id == MSG_INDEX_NOT_CONSECUTIVE)
+        return is_expected_index(found, see);
+    return failure.id == MSG_INVALID_VALUE && is_numeric(see.compiler.data_type());
+}
+
+const mention *map_value(const knowledge &known, std::string_view attribute) {
+    auto found = std::find_if(known.map_values.begin(), known.map_values.end(),
+                              [&](const mention &each) { return each.text == attribute; });
+    return found == known.map_values.end() ? nullptr : &*found;
+}
+
+} // namespace check

@@ -13,6 +13,11 @@ const srtable_ctrl &row_of(int kind) {
     return sc_tables[static_cast<size_t>(kind)];
 }
 
+/* The staging record that stanzas of a kind fill; only looked at. */
+const char *record_of(const cdgen &cx, const srtable_ctrl &row) {
+    return sc_cb(const_cast<cdgen &>(cx), row);
+}
+
 } // namespace
 
 stepwise_compiler::stepwise_compiler(const char *source, const char *output, line_observer &observer) {
@@ -68,9 +73,9 @@ void stepwise_compiler::size_image() {
 
 /* ---- State ----------------------------------------------------------------------------------------------------- */
 
-bool stepwise_compiler::is_open(int kind) {
+bool stepwise_compiler::is_open(int kind) const {
     vx_uint32_t identifier = 0;
-    memcpy(&identifier, sc_cb(cx, row_of(kind)), sizeof identifier);
+    memcpy(&identifier, record_of(cx, row_of(kind)), sizeof identifier);
     return identifier != 0;
 }
 
@@ -78,10 +83,10 @@ int stepwise_compiler::previous_kind() const {
     return cx.prev_scp == nullptr ? -1 : static_cast<int>(cx.prev_scp - sc_tables.data());
 }
 
-vx_data_type_t stepwise_compiler::data_type() {
+vx_data_type_t stepwise_compiler::data_type() const {
     vx_data_type_t type = VX_UNKNOWN;
     if (cx.scp->dt_offset >= 0)
-        memcpy(&type, sc_cb(cx, *cx.scp) + cx.scp->dt_offset, sizeof type);
+        memcpy(&type, record_of(cx, *cx.scp) + cx.scp->dt_offset, sizeof type);
     return type;
 }
 

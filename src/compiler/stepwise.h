@@ -48,7 +48,7 @@ public:
     }
 
     /* Whether a record of the kind is open. The kinds of structured data share one. */
-    bool is_open(int kind);
+    bool is_open(int kind) const;
     bool run_is_open() const {
         return cx.cb_sd_def.sd_cb_ID != 0;
     }
@@ -62,7 +62,7 @@ public:
         return cx.stanzas[static_cast<size_t>(kind)].req_mask;
     }
     /* The data type that the current stanza has given; unknown if its kind takes none. */
-    vx_data_type_t data_type();
+    vx_data_type_t data_type() const;
 
     /* The index of the run's latest element, and the one that the next element must have. */
     int element_index() const {

@@ -5,11 +5,16 @@
 #include "cdef/cdef.h"
 #include "cdef/support/output.h"
 #include "cdef/support/trouble.h"
+#include "report/report.h"
 
 #include <CLI/CLI.hpp>
 
-#include <algorithm>
+#include <cstddef>
+#include <cstdio>
 #include <memory>
+#include <string>
+#include <utility>
+#include <vector>
 
 namespace cdef {
 
@@ -42,7 +47,7 @@ void switch_warnings(check::warning_set &set, const std::vector<std::string> &na
                 set[known.id] = on;
 }
 
-/* All but those that are not wanted; and what is named both ways is wanted. */
+/* All but the unwanted ones; a name that is given both ways is wanted. */
 check::warning_set chosen(const check_options &options) {
     check::warning_set set;
     set.fill(true);
@@ -51,38 +56,57 @@ check::warning_set chosen(const check_options &options) {
     return set;
 }
 
-void show_text(const check::result &checked) {
-    std::string text = check::as_text(checked);
+void show_text(const std::string &text) {
     if (std::fwrite(text.data(), 1, text.size(), stderr) != text.size())
         throw trouble("standard error: cannot write");
 }
 
-void show(const std::vector<check::result> &results, const std::string &format) {
-    if (format == "json")
-        print(check::as_json(results));
-    if (format == "sarif")
-        print(check::as_sarif(results));
+/* Checks a source and shows what is found in it. */
+check::totals check_as_text(const std::string &source, const check::warning_set &wanted) {
+    constexpr std::size_t PORTION = 65536; /* bytes that are written at once */
+    std::string text;
+    check::totals count = check::check_file(source, wanted, [&](const check::finding &found) {
+        text += report::as_text(source, found);
+        if (text.size() >= PORTION)
+            show_text(std::exchange(text, {}));
+    });
+    show_text(text);
+    return count;
 }
 
-/* All sources but those that cannot be read, of which is told at once; so is of findings in text form. */
+report::checked_source check_for_later(const std::string &source, const check::warning_set &wanted) {
+    report::checked_source checked = {.file = source, .findings = {}, .count = {}};
+    checked.count = check::check_file(source, wanted,
+                                      [&](check::finding &&found) { checked.findings.push_back(std::move(found)); });
+    return checked;
+}
+
+void show(const std::vector<report::checked_source> &checked, const std::string &format) {
+    if (format == "json")
+        print(report::as_json(checked));
+    if (format == "sarif")
+        print(report::as_sarif(checked));
+}
+
+/* Checks all sources. One that cannot be read is reported at once, and so are findings in text form. */
 int check_all(const check_options &options) {
-    std::vector<check::result> results;
+    std::vector<report::checked_source> all;
     bool pass = true;
     bool read = true;
     for (const std::string &source : options.sources) {
         try {
-            check::result checked = check::check_source(source, chosen(options));
-            pass = pass && checked.errors == 0 && (checked.warnings == 0 || !options.warnings_count);
+            check::totals count;
             if (options.format == "text")
-                show_text(checked);
+                count = check_as_text(source, chosen(options));
             else
-                results.push_back(std::move(checked));
-        } catch (const trouble &unreadable) {
+                count = all.emplace_back(check_for_later(source, chosen(options))).count;
+            pass = pass && count.errors == 0 && (count.warnings == 0 || !options.warnings_count);
+        } catch (const check::cannot_check &unreadable) {
             tell(unreadable.what());
             read = false;
         }
     }
-    show(results, options.format);
+    show(all, options.format);
     return !read ? TROUBLE : pass ? OK : FOUND;
 }
 

@@ -1,30 +1,146 @@
-/* messages.cpp: the warnings: data only. docs/messages.md explains each. */
+/* registry.cpp: the table of warnings: what is said about each, and what makes it. docs/messages.md is checked against
+ * it. The rows are in the order in which the warnings are given an event, which is that of findings in one line. */
 
-#include "check/check.h"
+#include "check/warnings/registry.h"
 
-namespace cdef::check {
+#include <algorithm>
+#include <iterator>
+#include <string_view>
+#include <utility>
 
-constinit const std::array<warning, WARNING_COUNT> warnings = {{
-    {SD_RUN_AT_END, "S501", "sd-run-at-end", "the run of an SD-typed attribute ends the file"},
-    {SD_WITHOUT_RUN, "S502", "sd-without-run", "an SD-typed attribute has no elements"},
-    {RANGE_ELSEWHERE, "S503", "range-elsewhere", "a Range does not reach its attribute"},
-    {UNKNOWN_LOCATOR, "S504", "unknown-locator", "a Locator names no attribute"},
-    {UNKNOWN_VARIABLE_CLASS, "S505", "unknown-variable-class", "a VariableClass names no variable class"},
-    {SAME_NAME, "S506", "same-name", "two of one kind have the same name"},
-    {SAME_ID, "S507", "same-id", "two of one kind have the same Id"},
-    {NARROWED, "S508", "narrowed", "a number does not fit and is cut"},
-    {OCTAL, "S509", "octal", "a leading 0 makes a number octal"},
-    {NUMBER_TEXT, "S510", "number-text", "a number is followed by text, or there is none"},
-    {UNUSED_DEFAULT, "S511", "unused-default", "a DefaultValue is never used"},
-    {PERMISSION, "S512", "permission", "a Permission is not one known letter"},
-    {ELEMENT_TYPE, "S513", "element-type", "an element's data type is unknown"},
-    {CUT_SHORT, "S514", "cut-short", "a second class ends an attribute unchecked"},
-    {INCOMPLETE, "S515", "incomplete", "a stanza lacks required attributes"},
-    {LONG_LINE, "S516", "long-line", "a line is read in pieces"},
-    {CARRIAGE_RETURN, "S517", "carriage-return", "a line has a carriage return"},
-    {STRAY_RUN, "S518", "stray-run", "an action's elements have no action"},
-    {LOW_ABOVE_HIGH, "S519", "low-above-high", "the lower bound is above the upper one"},
-    {TEXT_AFTER_QUOTE, "S520", "text-after-quote", "text follows the quote that seems to end a value"},
-}};
+namespace check {
 
-} // namespace cdef::check
+/* To add a warning: a class in a file of this folder, its maker, a row, and its id. */
+maker make_carriage_return, make_cut_short, make_element_type, make_incomplete, make_long_line, make_low_above_high,
+    make_narrowed, make_number_text, make_octal, make_permission, make_range_elsewhere, make_same_id, make_same_name,
+    make_sd_run_at_end, make_sd_without_run, make_stray_run, make_text_after_quote, make_unknown_locator,
+    make_unknown_variable_class, make_unused_default;
+
+namespace {
+
+struct row {
+    warning known;
+    maker *make;
+};
+
+constexpr row rows[] = {
+    {{LONG_LINE, "S516", "long-line", "a line is read in pieces",
+      "A line has more than 253 characters. What comes after 254, even if it is only the newline, is read "
+      "as a line of its own, and the numbers of later lines are one higher. Reported once for each line.",
+      "Shorten the line or its comment."},
+     make_long_line},
+    {{CARRIAGE_RETURN, "S517", "carriage-return", "a line has a carriage return",
+      "A line ends with a carriage return, or contains one. It is part of the line's text. Reported once.",
+      "Save the source with newlines only."},
+     make_carriage_return},
+    {{TEXT_AFTER_QUOTE, "S520", "text-after-quote", "text follows the quote that seems to end a value",
+      "A value in quotes contains another quote, with text after it.", "Write `\\\"` for a quote that is intended."},
+     make_text_after_quote},
+    {{NUMBER_TEXT, "S510", "number-text", "a number is followed by text, or there is none",
+      "Text after a number is ignored; or there is no number and 0 is stored, as for a part of `1..2`.",
+      "Write only the number."},
+     make_number_text},
+    {{NARROWED, "S508", "narrowed", "a number does not fit and is cut",
+      "A number does not fit its field, so only its low bits are stored. Or a run has more than 65536 "
+      "elements, so that the highest index does not fit 16 bits.",
+      "Use a smaller number, or a wider type."},
+     make_narrowed},
+    {{OCTAL, "S509", "octal", "a leading 0 makes a number octal",
+      "A leading 0 makes a number octal, and its value differs from the decimal one.",
+      "Remove the 0, or write the number in decimal."},
+     make_octal},
+    {{LOW_ABOVE_HIGH, "S519", "low-above-high", "the lower bound is above the upper one",
+      "A lower bound is greater than the upper one.", "Exchange them."},
+     make_low_above_high},
+    {{SAME_ID, "S507", "same-id", "two of one kind have the same Id",
+      "Two attributes or actions of one kind have the same `Id`. Text that is not a number (S510) does "
+      "not count.",
+      "Give one of them another number."},
+     make_same_id},
+    {{SAME_NAME, "S506", "same-name", "two of one kind have the same name",
+      "Two attributes, actions or elements of one kind have the same name.", "Rename one."},
+     make_same_name},
+    {{RANGE_ELSEWHERE, "S503", "range-elsewhere", "a Range does not reach its attribute",
+      "A `Range` of a `DynamicClassAttribute` is stored in a `DynamicResourceAttribute` that is still "
+      "open. Or another dynamic attribute is completed first, which clears the mark that a `Range` was "
+      "given.",
+      "Put dynamic class attributes first, and one without a `Range` last among them. After an attribute "
+      "with a `Range`, put another of its kind."},
+     make_range_elsewhere},
+    {{UNUSED_DEFAULT, "S511", "unused-default", "a DefaultValue is never used",
+      "A `PersistentClassAttribute` has a `DefaultValue`, which is never used.", "Remove the line."},
+     make_unused_default},
+    {{PERMISSION, "S512", "permission", "a Permission is not one known letter",
+      "A `Permission` has more than one letter, of which only the first counts; or the letter is unknown, "
+      "so that no permission is needed.",
+      "Write one of q, l, e, v, d, c, s, o, a and x."},
+     make_permission},
+    {{ELEMENT_TYPE, "S513", "element-type", "an element's data type is unknown",
+      "The `DataType` of an element is unknown, so type 0 is stored.", "Use one of the names in language.md."},
+     make_element_type},
+    {{INCOMPLETE, "S515", "incomplete", "a stanza lacks required attributes",
+      "A stanza lacks required attributes, which the compiler does not notice: their fields are 0.", "Add them."},
+     make_incomplete},
+    {{SD_WITHOUT_RUN, "S502", "sd-without-run", "an SD-typed attribute has no elements",
+      "An attribute of type `SD` or `SDArray` is not directly followed by its elements.",
+      "Put them directly after it."},
+     make_sd_without_run},
+    {{SD_RUN_AT_END, "S501", "sd-run-at-end", "the run of an SD-typed attribute ends the file",
+      "The elements of an attribute of structured data end the file. The attribute is completed before "
+      "them, so it has no value and no highest index.",
+      "Put another stanza after them, for example by moving the elements up."},
+     make_sd_run_at_end},
+    {{STRAY_RUN, "S518", "stray-run", "an action's elements have no action",
+      "`ActionInSDDefinition` or `ActionOutSDDefinition` comes where no action is open. Not reported if "
+      "an error shows that the action's header is missing.",
+      "Put it after its action."},
+     make_stray_run},
+    {{CUT_SHORT, "S514", "cut-short", "a second class ends an attribute unchecked",
+      "A second `ControlDefinition` ends an open attribute as it is, without checks and defaults.",
+      "Put each class in a file of its own."},
+     make_cut_short},
+    {{UNKNOWN_LOCATOR, "S504", "unknown-locator", "a Locator names no attribute",
+      "A `Locator` names no `PersistentResourceAttribute` of the last class.", "Correct the name."},
+     make_unknown_locator},
+    {{UNKNOWN_VARIABLE_CLASS, "S505", "unknown-variable-class", "a VariableClass names no variable class",
+      "A `VariableClass` names no `ResourceVariableClass`, so the attribute belongs to none. Reported "
+      "once for each name, where it is first given, and not while a `ResourceVariableClass` has no name "
+      "itself (S515).",
+      "Correct the name, or define the variable class."},
+     make_unknown_variable_class},
+};
+
+constexpr std::array<warning, WARNING_COUNT> by_id() {
+    std::array<warning, WARNING_COUNT> all = {};
+    for (const row &each : rows)
+        all[each.known.id] = each.known;
+    return all;
+}
+
+/* Codes ascend with the ids, and no id lacks its row. */
+constexpr bool is_whole(const std::array<warning, WARNING_COUNT> &all) {
+    auto no_ascent = [](const warning &a, const warning &b) {
+        return std::string_view(a.code) >= std::string_view(b.code);
+    };
+    return std::size(rows) == WARNING_COUNT && std::adjacent_find(all.begin(), all.end(), no_ascent) == all.end();
+}
+
+static_assert(is_whole(by_id()));
+
+} // namespace
+
+constinit const std::array<warning, WARNING_COUNT> warnings = by_id();
+
+watchers::watchers(const warning_set &wanted, findings &found) {
+    for (const row &each : rows) {
+        if (!wanted[each.known.id])
+            continue;
+        made_watcher made = each.make({warnings[each.known.id], found});
+        for (size_t event = 0; event < EVENTS; ++event)
+            if (made.events[event])
+                of_event[event].push_back(made.warning.get());
+        all.push_back(std::move(made.warning));
+    }
+}
+
+} // namespace check

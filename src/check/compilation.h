@@ -1,0 +1,70 @@
+/* compilation.h: the compiler as a check drives it, and which of its stanzas are broken. */
+#ifndef CDGEN_CHECK_COMPILATION_H
+#define CDGEN_CHECK_COMPILATION_H
+
+#include "check/known.h"
+#include "compiler/stepwise.h"
+#include "language/suggestions.h"
+
+#include <string>
+
+namespace check {
+
+/* The words of an error, as the compiler prints them. */
+std::string text_of(const fatal_exit &failure);
+
+class compilation : private line_observer, public stepwise_compiler {
+public:
+    /* The source's name must stay as long as this. */
+    explicit compilation(const char *source) : stepwise_compiler(source, CLASS_NAME, *this), source_name(source) {}
+
+    const char *name() const {
+        return source_name;
+    }
+
+    /* Takes an attribute line. Throws fatal_exit. */
+    void take_attribute(const attr_text &text) {
+        attribute = {};
+        take_line(text);
+    }
+    /* The attribute of the latest line, as far as the compiler came. */
+    const attr_place &latest() const {
+        return attribute;
+    }
+
+    /* ---- The latest stanza of a kind */
+
+    /* Required attributes that it has not given. */
+    language::name_list missing(int kind) const;
+    bool is_complete(int kind) const {
+        return required_seen(kind) == table_of(kind).req_mask_cmplt;
+    }
+    /* That is an element. */
+    bool has_index(int kind) const;
+
+    /* An error of it has been reported: nothing is missed in it any more. */
+    bool is_broken(int kind) const {
+        return broken.test(index_of(kind));
+    }
+    void set_broken(int kind, bool is = true) {
+        broken.set(index_of(kind), is);
+    }
+
+private:
+    static constexpr const char *CLASS_NAME = "class.cdef"; /* the output file is not known: any good name */
+
+    void attribute_read(const attr_place &read) override {
+        attribute = read;
+    }
+    bool excuses_missing(int kind) const override {
+        return is_broken(kind);
+    }
+
+    const char *source_name;
+    attr_place attribute;
+    kind_set broken;
+};
+
+} // namespace check
+
+#endif

@@ -1,0 +1,58 @@
+/* first_lines.h: texts, each with the line that gave it first. There may be very many. */
+#ifndef CDGEN_CHECK_FIRST_LINES_H
+#define CDGEN_CHECK_FIRST_LINES_H
+
+#include "vx.h"
+
+#include <cstddef>
+#include <functional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace check {
+
+class first_lines {
+public:
+    /* The line for a text, to be set; 0 if the text is new. */
+    int &line_of(std::string_view text) {
+        return line_of(text, tag_of(text));
+    }
+    /* A number is its own tag: numbers mostly ascend, and so their slots are close together. */
+    int &line_of(vx_uint32_t number) {
+        return line_of({reinterpret_cast<const char *>(&number), sizeof number}, number);
+    }
+    bool has(std::string_view text) const;
+    /* All texts, in the order in which they came; valid until the next one is added. */
+    std::vector<std::string_view> all() const;
+    void clear();
+
+private:
+    struct entry {
+        size_t begin; /* in texts; it ends where the next one begins */
+        int line;
+    };
+    struct slot {
+        unsigned tag;      /* a hash: says where the slot is, and that most other texts need no comparison */
+        unsigned position; /* in entries, from 1; 0 is free */
+    };
+
+    static unsigned tag_of(std::string_view text) {
+        return static_cast<unsigned>(std::hash<std::string_view>()(text) >> 32);
+    }
+    int &line_of(std::string_view text, unsigned tag);
+    size_t slot_of(std::string_view text, unsigned tag) const;
+    void grow();
+    std::string_view text_of(size_t position) const {
+        size_t end = position < entries.size() ? entries[position].begin : texts.size();
+        return std::string_view(texts).substr(0, end).substr(entries[position - 1].begin);
+    }
+
+    std::string texts;
+    std::vector<entry> entries;
+    std::vector<slot> slots;
+};
+
+} // namespace check
+
+#endif

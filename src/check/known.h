@@ -1,0 +1,120 @@
+/* known.h: what a check remembers of the source so far. The driver and the recovery write it; notes and warnings read
+ * it. */
+#ifndef CDGEN_CHECK_KNOWN_H
+#define CDGEN_CHECK_KNOWN_H
+
+#include "check/check.h"
+#include "check/first_lines.h"
+#include "compiler/cdgen.h"
+
+#include <algorithm>
+#include <array>
+#include <bitset>
+#include <initializer_list>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace check {
+
+constexpr int NO_KIND = -1;      /* no stanza, or one that is skipped */
+constexpr size_t ATTRS_MAX = 32; /* attributes of one kind */
+
+using kind_set = std::bitset<SC_COUNT>;
+
+constexpr size_t index_of(int kind) {
+    return static_cast<size_t>(kind);
+}
+
+inline const srtable_ctrl &table_of(int kind) {
+    return sc_tables[index_of(kind)];
+}
+
+inline bool is_sd_kind(int kind) {
+    return table_of(kind).sc_sd_owner != nullptr;
+}
+
+/* A name or a number at a place of the source. */
+struct mention {
+    place at;
+    std::string text;
+    std::string source; /* the line */
+};
+
+/* Attributes of a stanza whose lines were refused. */
+struct refused_attributes {
+    bool has_any(std::initializer_list<attr_type> wanted) const {
+        return std::any_of(wanted.begin(), wanted.end(), [this](attr_type type) { return types.test(type); });
+    }
+    /* Nothing stands for a name that is like none of the kind's. */
+    void add(std::optional<int> type) {
+        if (type)
+            types.set(index_of(*type));
+        else
+            unknown_name = true;
+    }
+
+    std::bitset<AT_COUNT> types;
+    bool unknown_name = false;
+};
+
+/* The latest stanza of a kind. */
+struct stanza_record {
+    place header;
+    std::string source;                    /* the header's line */
+    std::array<int, ATTRS_MAX> given = {}; /* line of each attribute, by its position in the kind; 0: none */
+    refused_attributes refused;
+    mention data_type;      /* the value of its DataType */
+    bool misplaced = false; /* it seems to contain lines of another stanza */
+};
+
+/* Stanzas whose headers could not be understood. */
+struct lost_stanzas {
+    bool may_be(int kind) const {
+        return kinds.test(index_of(kind));
+    }
+
+    kind_set kinds;     /* that they may have been of */
+    bool owner = false; /* one may have been the action that the next run belongs to */
+};
+
+/* The latest run of elements. */
+struct element_run {
+    int kind = SC_PATTR_SD_DEFINITION;
+    std::vector<mention> odd_types; /* DataTypes of elements for which the run's default may fail */
+    bool odd_type_reported = false; /* there were others, which have been reported */
+    int without_index = 0;          /* header line of the latest element without ElementIndex; 0: none */
+};
+
+/* Names and Ids that the current class gives, or for elements the current run. */
+struct declarations {
+    std::array<first_lines, SC_COUNT> names;
+    std::array<first_lines, SC_COUNT> ids;
+    int earlier_name = 0; /* the line that gave the current line's name first; 0: none did */
+    int earlier_id = 0;
+};
+
+struct knowledge {
+    const stanza_record &stanza() const {
+        return stanzas[index_of(kind)];
+    }
+    stanza_record &stanza() {
+        return stanzas[index_of(kind)];
+    }
+
+    int kind = NO_KIND;        /* of the current stanza */
+    bool skipping = false;     /* nothing of the current stanza can be understood */
+    bool class_forged = false; /* the open class has no stanza */
+    std::array<stanza_record, SC_COUNT> stanzas;
+    lost_stanzas lost;
+    element_run run;
+    declarations declared;
+    int overflow_line = 0;           /* of the latest number whose overflow affects later ones; 0: none */
+    int map_line = 0;                /* header of the latest ClassToManagerMapping; 0: none */
+    std::vector<mention> map_values; /* of all its attributes; the texts are the attributes' names */
+};
+
+} // namespace check
+
+#endif

@@ -1,0 +1,226 @@
+/* recover_attribute.cpp: takes attribute lines, and continues after one that is refused. */
+
+#include "check/names.h"
+#include "check/notes.h"
+#include "check/numbers.h"
+#include "check/recovery.h"
+
+namespace check {
+
+namespace {
+
+/* Whether an attribute's text is converted as the stanza's data type says. */
+bool is_typed(int attr_type) {
+    switch (attr_type) {
+    case AT_VALID_VALUE:
+    case AT_SD_VALID_VALUE:
+    case AT_DEFAULT_VALUE:
+    case AT_INITIAL_VALUE:
+    case AT_RANGE:
+        return true;
+    default:
+        return false;
+    }
+}
+
+/* The attribute that stanzas of most kinds begin with. */
+bool is_name(std::string_view attribute) {
+    return attribute == "Name" || attribute == "VariableClass";
+}
+
+} // namespace
+
+void recovery::take_attribute() {
+    if (known.skipping && set_table_id(line.text.name) < 0)
+        return;
+    int errno_before = compiler.conversion_errno();
+    try {
+        compiler.take_attribute(line.text);
+    } catch (const fatal_exit &failure) {
+        return recover_attribute(failure);
+    }
+    if (compiler.conversion_errno() != errno_before)
+        known.overflow_line = line.number;
+    if (compiler.latest().attr == nullptr)
+        return;
+    note_given();
+    if (!known.stanza().misplaced)
+        note_value();
+    warned.attribute(see);
+}
+
+/* ---- What is remembered of values ------------------------------------------------------------------------------ */
+
+/* In place, since this is done for each attribute and element. */
+void recovery::note_value() {
+    known.declared.earlier_name = known.declared.earlier_id = 0;
+    int type = see.attr().ta_type;
+    if (type == AT_STRING || type == AT_SD_NAME || type == AT_ID)
+        return declare();
+    if (type != AT_DATA_TYPE && type != AT_SD_DATA_TYPE)
+        return;
+    mention &given = known.stanza().data_type;
+    given.at = see.value_place();
+    given.text = see.value();
+    given.source = line.raw;
+    bool odd = compiler.data_type() == VX_UNKNOWN || given.text == "SBS";
+    if (type == AT_SD_DATA_TYPE && odd && compiler.run_makes_value())
+        known.run.odd_types.push_back(given);
+}
+
+/* Text that is not a number is no Id: it has a warning of its own. */
+void recovery::declare() {
+    std::string_view attr = see.attr().ta_name;
+    int *line_of_first = nullptr;
+    int *earlier = nullptr;
+    if (see.attr().ta_type == AT_ID) {
+        number n(see.value(), 0);
+        if (n.read == 0)
+            return;
+        line_of_first = &known.declared.ids[index_of(known.kind)].line_of(static_cast<vx_uint32_t>(n.value));
+        earlier = &known.declared.earlier_id;
+    } else if ((attr == "Name" || attr == "ElementName") && known.kind != SC_RESOURCE_CLASS) {
+        line_of_first = &known.declared.names[index_of(known.kind)].line_of(see.value());
+        earlier = &known.declared.earlier_name;
+    } else {
+        return;
+    }
+    *earlier = *line_of_first;
+    if (*line_of_first == 0)
+        *line_of_first = line.number;
+}
+
+/* ---- Errors ---------------------------------------------------------------------------------------------------- */
+
+void recovery::recover_attribute(const fatal_exit &failure) {
+    if (std::string_view meant = header_meant(failure); !meant.empty())
+        return indented_header(meant, failure);
+    if (known.kind < 0)
+        return lose_first_header(failure);
+    const attr_place latest = compiler.latest();
+    bool consequence = follows(failure);
+    if (!consequence && may_follow(failure)) {
+        finding &error = report(failure, line.marked(message_of(failure.id).mark, latest, failure.detail1));
+        add_notes(error, failure, known.kind, see);
+        if (blames_overflow(error, failure, see))
+            found.retract(NARROWED, known.overflow_line);
+    }
+    recover_value(failure, consequence);
+    compiler.set_broken(known.kind);
+    if (failure.id == MSG_OPTIONAL_TOO_EARLY)
+        take_quietly(std::string_view(line.raw).substr(0, line.all().column - 1 + line.all().length), 0);
+    else
+        note_refused(latest.attr == nullptr ? type_meant() : std::optional(latest.attr->ta_type));
+    compiler.forget_overflow(); /* its mark would report the same number twice */
+}
+
+/* The stanza kind that a line is nearly the name of, although it begins with a blank. */
+std::string_view recovery::header_meant(const fatal_exit &failure) const {
+    bool whole = failure.id == MSG_NO_EQUALS || failure.id == MSG_NO_STANZA;
+    return whole ? language::near_miss(line.whole(), stanza_names()) : std::string_view();
+}
+
+void recovery::indented_header(std::string_view meant, const fatal_exit &failure) {
+    bool exact = std::string_view(line.text.name) == meant;
+    finding &error = report(failure, line.all());
+    error.notes.push_back({line.all(), "a stanza begins in column 1"});
+    if (!exact)
+        error.notes.push_back({line.all(), language::suggestion(line.text.name, stanza_names())});
+    take_header(line.replaced(meant), !exact);
+}
+
+/* After an attribute line in front of any header. */
+void recovery::lose_first_header(const fatal_exit &failure) {
+    std::string_view text = line.whole();
+    kind_set kinds = kinds_with(text.substr(0, text.find('=')));
+    report_with_notes(failure, line.all(), NO_KIND);
+    lose_header(kinds.none() ? kinds.set() : kinds);
+    skip_stanza();
+}
+
+std::string_view recovery::name_given() const {
+    return line.at(see.name_place());
+}
+
+/* The attribute type of a line that could not be read; nothing if its name is like none of the kind's. */
+std::optional<int> recovery::type_meant() const {
+    const srtable_ctrl &table = table_of(known.kind);
+    std::string_view name = name_given();
+    const table_attrs *attr = find_attr(table, name);
+    if (std::string_view meant = language::near_miss(name, attribute_names(table)); attr == nullptr && !meant.empty())
+        attr = find_attr(table, meant);
+    return attr == nullptr ? std::nullopt : std::optional(attr->ta_type);
+}
+
+/* Whether an attribute's error is a consequence of one that has been reported. */
+bool recovery::follows(const fatal_exit &failure) {
+    if (failure.id == MSG_INDEX_NOT_CONSECUTIVE)
+        return index_lost || (other_index >= 0 && compiler.element_index() == other_index);
+    if (failure.id == MSG_NO_STRING_TABLE)
+        return is_reported_otherwise(failure);
+    const attr_place &latest = compiler.latest();
+    bool typed = latest.attr != nullptr && is_typed(latest.attr->ta_type);
+    bool untyped =
+        compiler.is_broken(known.kind) && table_of(known.kind).dt_offset >= 0 && compiler.data_type() == VX_UNKNOWN;
+    if (typed && untyped && failure.id == MSG_INVALID_VALUE)
+        return true;
+    const refused_attributes &refused = known.stanza().refused;
+    bool value_refused = refused.has_any({AT_VALID_VALUE, AT_SD_VALID_VALUE}) || refused.unknown_name;
+    if (failure.id == MSG_NO_VALID_VALUE && value_refused)
+        return true;
+    return is_misplaced(failure);
+}
+
+/* Whether a line belongs to another stanza, as one before it did. The first such line is only noted: a second name, or
+ * an attribute that other kinds have and this one has not. */
+bool recovery::is_misplaced(const fatal_exit &failure) {
+    bool unknown = failure.id == MSG_UNKNOWN_ATTRIBUTE && !type_meant();
+    bool repeated = failure.id == MSG_REPEATED_ATTRIBUTE;
+    bool &before = known.stanza().misplaced;
+    if (before)
+        return unknown || repeated || failure.id == MSG_INVALID_VALUE || failure.id == MSG_NO_VALID_VALUE;
+    bool first_attribute = compiler.latest().attr == table_of(known.kind).sc_attrs.data();
+    bool named = repeated && (first_attribute || is_name(name_given()));
+    kind_set kinds = unknown || named ? kinds_with(name_given()) : kind_set();
+    before = kinds.any();
+    if (!before)
+        return false;
+    lose_header(kinds);
+    index_lost = index_lost || is_sd_kind(known.kind); /* this may be another run */
+    if (int previous = compiler.previous_kind(); unknown && previous >= 0)
+        break_if_incomplete(previous); /* what it lacks may be here */
+    return false;
+}
+
+/* ---- What an error leaves to be done, besides its stanza's being broken ----------------------------------------- */
+
+void recovery::recover_value(const fatal_exit &failure, bool consequence) {
+    if (failure.id == MSG_INDEX_NOT_CONSECUTIVE) {
+        if (!consequence)
+            found.retract(INCOMPLETE, known.run.without_index);
+        recover_index(consequence);
+    }
+    if (failure.id == MSG_NO_STRING_TABLE)
+        forge_class();
+    if (is_sd_kind(known.kind) && failure.id == MSG_INVALID_VALUE && compiler.data_type() == VX_UNKNOWN)
+        report_type_here();
+}
+
+/* After a wrong index the count either continues from it, or skips it. */
+void recovery::recover_index(bool consequence) {
+    int expected = compiler.expected_index();
+    other_index = consequence ? -1 : expected + 1;
+    bool read = compiler.element_index() + 1 != expected;
+    compiler.expect_index(read ? compiler.element_index() + 1 : expected + 1);
+    index_lost = false;
+}
+
+/* A value was refused because its element has no known type. That has been reported: not at the run's end as well. */
+void recovery::report_type_here() {
+    int type_line = known.stanza().data_type.at.line;
+    size_t others = std::erase_if(known.run.odd_types, [&](const mention &odd) { return odd.at.line == type_line; });
+    known.run.odd_type_reported = known.run.odd_type_reported || others > 0;
+    found.retract(ELEMENT_TYPE, type_line);
+}
+
+} // namespace check

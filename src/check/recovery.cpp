@@ -1,0 +1,154 @@
+/* recovery.cpp: what the recovery does about headers, attribute lines and the end of the source alike. */
+
+#include "check/recovery.h"
+
+#include "check/lacking.h"
+#include "check/notes.h"
+
+#include <utility>
+
+namespace check {
+
+recovery::recovery(compilation &compiler_driven, current_line &line_taken, knowledge &known_so_far,
+                   findings &found_so_far, const view &see_all, const watchers &warnings_told)
+    : compiler(compiler_driven), line(line_taken), known(known_so_far), found(found_so_far), see(see_all),
+      warned(warnings_told) {}
+
+/* ---- Errors --------------------------------------------------------------------------------------------------- */
+
+finding &recovery::report(const fatal_exit &failure, const place &at) {
+    const message &row = message_of(failure.id);
+    if (row.whose == blame::surroundings)
+        throw cannot_check(std::string(compiler.name()) + ": " + text_of(failure));
+    error_line = line.number;
+    return found.error(row, at, line.raw, text_of(failure));
+}
+
+void recovery::report_with_notes(const fatal_exit &failure, const place &at, int kind) {
+    add_notes(report(failure, at), failure, kind, see);
+}
+
+/* Whether an error may be a mistake of its own. One that no source causes is not, after others. */
+bool recovery::may_follow(const fatal_exit &failure) const {
+    return found.errors() == 0 || message_of(failure.id).whose != blame::program;
+}
+
+/* Whether the stanza that an error misses has been reported: it is broken, or its header is lost. */
+bool recovery::is_reported_otherwise(const fatal_exit &failure) const {
+    bool map_broken = compiler.is_broken(SC_CLASS_TO_MANAGER_MAPPING);
+    switch (failure.id) {
+    case MSG_NO_CLASSES:
+    case MSG_NO_STRING_TABLE:
+        return known.lost.may_be(SC_CONTROL_DEFINITION);
+    case MSG_NO_MAPS:
+        return known.lost.may_be(SC_CLASS_TO_MANAGER_MAPPING);
+    case MSG_NO_MANAGER: /* that there is no map has been reported */
+        return map_broken || known.map_line == 0;
+    case MSG_KEYS_REVERSED:
+        return map_broken;
+    case MSG_SBS_TYPE:
+    case MSG_NO_ELEMENT_DEFAULT:
+    case MSG_NO_ELEMENT_INITIAL:
+        return known.run.odd_type_reported && known.run.odd_types.empty();
+    default:
+        return false;
+    }
+}
+
+/* The kind whose completion failed. */
+int recovery::failed_kind(const fatal_exit &failure) const {
+    int kind = failure.completing;
+    return kind >= 0 && is_sd_kind(kind) ? known.run.kind : kind;
+}
+
+/* ---- Stanzas and records -------------------------------------------------------------------------------------- */
+
+void recovery::end_stanza(int next_kind) {
+    warned.stanza_end(see, next_kind);
+    if (known.kind >= 0 && is_sd_kind(known.kind) && !lacking_unnoticed(see, next_kind).empty())
+        known.run.without_index = known.stanza().header.line;
+}
+
+/* Stanzas before the class, or without any, are checked in a class of their own. */
+void recovery::forge_class() {
+    if (compiler.forge_class())
+        known.class_forged = true;
+}
+
+void recovery::drop_record(int kind) {
+    compiler.drop_record(kind);
+    warned.dropped(see, kind);
+}
+
+/* After the completion of a record failed. */
+void recovery::abandon(int kind, const fatal_exit &failure) {
+    if (!is_sd_kind(kind))
+        drop_record(kind);
+    else if (failure.id == MSG_INCOMPLETE_STANZA)
+        compiler.complete_element();
+    else
+        compiler.give_up_run();
+}
+
+/* What has been reported is not completed: its record is dropped before the compiler comes to it. */
+void recovery::settle_broken(int next_kind) {
+    if (compiler.run_is_open() && compiler.is_broken(known.run.kind))
+        compiler.complete_element();
+    if (next_kind >= 0 && is_sd_kind(next_kind))
+        return;
+    for (int kind : {SC_PERSISTENT_RESOURCE_ATTRIBUTE, SC_PERSISTENT_CLASS_ATTRIBUTE, SC_DYNAMIC_RESOURCE_ATTRIBUTE,
+                     SC_DYNAMIC_CLASS_ATTRIBUTE, SC_RESOURCE_ACTION, SC_CLASS_ACTION})
+        if (compiler.is_open(kind) && compiler.is_broken(kind))
+            drop_record(kind);
+}
+
+void recovery::skip_stanza() {
+    known.skipping = true;
+    known.kind = NO_KIND;
+}
+
+/* There is a stanza of one of these kinds without its header. */
+void recovery::lose_header(const kind_set &kinds) {
+    known.lost.kinds |= kinds;
+    known.lost.owner = known.lost.owner || kinds.test(SC_CLASS_ACTION) || kinds.test(SC_RESOURCE_ACTION);
+}
+
+/* What the latest stanza of a kind lacks may be in lines that are not understood. */
+void recovery::break_if_incomplete(int kind) {
+    if (!compiler.is_complete(kind))
+        compiler.set_broken(kind);
+}
+
+/* ---- Attributes that have been taken --------------------------------------------------------------------------- */
+
+void recovery::note_given() {
+    const attr_place &latest = compiler.latest();
+    if (latest.attr == nullptr)
+        return;
+    auto at = static_cast<size_t>(latest.attr - table_of(known.kind).sc_attrs.data());
+    int &given = known.stanza().given[at];
+    if (given == 0)
+        given = line.number;
+    if (known.kind == SC_CLASS_TO_MANAGER_MAPPING)
+        known.map_values.push_back({see.value_place(), latest.attr->ta_name, line.raw});
+    if (latest.attr->ta_type == AT_SD_INDEX)
+        index_lost = false;
+}
+
+void recovery::note_refused(const std::optional<int> &attr_type) {
+    compiler.set_broken(known.kind);
+    known.stanza().refused.add(attr_type);
+}
+
+/* Takes a text instead of the current line's, of which an error has been reported. */
+void recovery::take_quietly(std::string_view text, size_t added) {
+    try {
+        compiler.take_attribute(line.replaced(text, added));
+        note_given();
+    } catch (const fatal_exit &) {
+        const table_attrs *attr = compiler.latest().attr;
+        note_refused(attr == nullptr ? std::nullopt : std::optional(attr->ta_type));
+    }
+}
+
+} // namespace check

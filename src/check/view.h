@@ -1,0 +1,52 @@
+/* view.h: what warnings and notes see of a check: all of it, and they change nothing. */
+#ifndef CDGEN_CHECK_VIEW_H
+#define CDGEN_CHECK_VIEW_H
+
+#include "check/compilation.h"
+#include "check/current_line.h"
+#include "check/findings.h"
+#include "check/known.h"
+
+#include <string>
+#include <string_view>
+
+namespace check {
+
+struct view {
+    /* ---- The attribute of the current line, once the compiler has taken it. */
+    const table_attrs &attr() const {
+        return *compiler.latest().attr;
+    }
+    place value_place() const {
+        return part_of_value(0, compiler.latest().length);
+    }
+    place part_of_value(size_t offset, size_t length) const {
+        return line.part_of(compiler.latest(), offset, length);
+    }
+    std::string_view value() const {
+        return line.at(value_place());
+    }
+    mention value_mention() const {
+        return {value_place(), std::string(value()), line.raw};
+    }
+    place name_place() const {
+        return line.marked(mark_kind::name, compiler.latest());
+    }
+    place text_place() const {
+        return line.marked(mark_kind::text, compiler.latest());
+    }
+
+    /* Reported so far. */
+    size_t errors() const {
+        return found.errors();
+    }
+
+    const compilation &compiler;
+    const current_line &line;
+    const knowledge &known;
+    const findings &found;
+};
+
+} // namespace check
+
+#endif

@@ -1,0 +1,57 @@
+/* lines.cpp: warnings about lines as the compiler reads them. */
+
+#include "check/warnings/watcher.h"
+
+#include <string>
+
+namespace check {
+
+namespace {
+
+/* Reports each line once, when its second piece is met. */
+class long_line : public watcher {
+public:
+    using watcher::watcher;
+
+    void line(const view &see) override {
+        if (see.line.continues && !continued)
+            report({see.line.number - 1, 0, 0}, {},
+                   "line of more than 253 characters: the rest is read as a line of its own, and later lines count one "
+                   "more");
+        continued = see.line.continues;
+    }
+
+private:
+    bool continued = false; /* the line before was not the first piece either */
+};
+
+/* Reports the first one only: usually all lines have one. */
+class carriage_return : public watcher {
+public:
+    using watcher::watcher;
+
+    void line(const view &see) override {
+        size_t at = reported ? std::string::npos : see.line.raw.find('\r');
+        if (at == std::string::npos)
+            return;
+        reported = true;
+        std::string where = at + 1 == see.line.raw.size() ? "at the end of" : "within";
+        report(see, {see.line.number, at + 1, 1},
+               "carriage return " + where + " a line, which belongs to the line's text");
+    }
+
+private:
+    bool reported = false;
+};
+
+} // namespace
+
+made_watcher make_long_line(const watcher_setup &setup) {
+    return make<long_line>(setup);
+}
+
+made_watcher make_carriage_return(const watcher_setup &setup) {
+    return make<carriage_return>(setup);
+}
+
+} // namespace check

@@ -1,0 +1,161 @@
+/* numbers.cpp: warnings about numbers that are stored otherwise than they are written. */
+
+#include "check/numbers.h"
+
+#include "check/warnings/watcher.h"
+
+#include <cstdlib>
+#include <string>
+
+namespace check {
+
+namespace {
+
+/* The bits of a form that takes any base; 0 for others. */
+int bits_of(number_form form) {
+    return form == number_form::BITS16 ? 16 : form == number_form::BITS32 ? 32 : 0;
+}
+
+place place_of(const view &see, const number_part &part) {
+    return see.part_of_value(part.offset, part.text.size());
+}
+
+class number_text : public watcher {
+public:
+    using watcher::watcher;
+
+    void number(const view &see, const number_part &part) override {
+        if (part.form == number_form::VERSION_REST)
+            return report(see, place_of(see, part), "a version has four parts: these are cut off");
+        if (part.form != number_form::VERSION_PART && bits_of(part.form) == 0)
+            return;
+        check::number n(part.text, part.form == number_form::VERSION_PART ? 10 : 0);
+        if (n.read == 0)
+            report(see, place_of(see, part), "no number: it is read as 0");
+        else if (!n.rest().empty())
+            report(see, place_of(see, part),
+                   "only the number in front counts: it is read as " + std::to_string(n.value));
+    }
+};
+
+class narrowed : public watcher {
+public:
+    using watcher::watcher;
+
+    void number(const view &see, const number_part &part) override {
+        switch (part.form) {
+        case number_form::BITS16:
+        case number_form::BITS32:
+            return look_at_bits(see, part, bits_of(part.form));
+        case number_form::INT32:
+            return look_at_int32(see, part);
+        case number_form::UINT32:
+        case number_form::UINT64:
+            return look_at_unsigned(see, part);
+        case number_form::INDEX:
+            return look_at_index(see, part);
+        case number_form::VERSION_PART:
+            return look_at_version(see, part);
+        case number_form::VERSION_REST:
+            return;
+        }
+    }
+
+private:
+    void look_at_bits(const view &see, const number_part &part, int bits) {
+        check::number n(part.text, 0);
+        long limit = (1L << bits) - 1;
+        if (n.overflow || n.value < 0 || n.value > limit)
+            report(see, place_of(see, part),
+                   "does not fit " + std::to_string(bits) + " bits: it is stored as " +
+                       std::to_string(n.value & limit));
+    }
+
+    void look_at_int32(const view &see, const number_part &part) {
+        check::number n(part.text, 10);
+        auto stored = static_cast<vx_int32_t>(n.value);
+        if (n.overflow || n.value != stored)
+            report(see, place_of(see, part), "does not fit Int32: it is stored as " + std::to_string(stored));
+    }
+
+    /* Only the low bits are stored, and of a negative number its complement. */
+    void look_at_unsigned(const view &see, const number_part &part) {
+        bool wide = part.form == number_form::UINT64;
+        vx_uint64_t value = std::strtoull(std::string(part.text).c_str(), nullptr, 10);
+        vx_uint64_t stored = wide ? value : static_cast<vx_uint32_t>(value);
+        bool negative = part.text.find('-') != std::string_view::npos && value != 0;
+        if (negative || stored != value)
+            report(see, place_of(see, part),
+                   std::string("does not fit ") + (wide ? "UInt64" : "UInt32") + ": it is stored as " +
+                       std::to_string(stored));
+    }
+
+    /* The highest index of an attribute has 16 bits; this is reported once, at the first index above. */
+    void look_at_index(const view &see, const number_part &part) {
+        constexpr int TOO_HIGH = 1 << 16;
+        if (!is_plain(part.text, 32))
+            look_at_unsigned(see, part);
+        if (see.compiler.element_index() == TOO_HIGH && see.compiler.run_has_highest_index())
+            report(see, place_of(see, part), "does not fit 16 bits, which the attribute's highest index has");
+    }
+
+    void look_at_version(const view &see, const number_part &part) {
+        check::number n(part.text, 10);
+        if (n.overflow || n.value < 0 || n.value > 255)
+            report(see, place_of(see, part), "a part of a version has 8 bits");
+    }
+};
+
+class octal : public watcher {
+public:
+    using watcher::watcher;
+
+    void number(const view &see, const number_part &part) override {
+        if (bits_of(part.form) == 0)
+            return;
+        check::number n(part.text, 0);
+        size_t digits = part.text.find_first_not_of(" \t+-");
+        bool leading_zero = digits != std::string_view::npos && digits + 1 < n.read && part.text[digits] == '0' &&
+                            part.text[digits + 1] >= '0' && part.text[digits + 1] <= '7';
+        if (leading_zero && n.value != check::number(part.text, 10).value)
+            report(see, place_of(see, part), "a leading 0 makes it octal: it is read as " + std::to_string(n.value));
+    }
+};
+
+/* Bounds that do not fit their type are compared as they are written. */
+class low_above_high : public watcher {
+public:
+    using watcher::watcher;
+
+    void value(const view &see) override {
+        int type = see.attr().ta_type;
+        bool variety = type == AT_VARIETY;
+        if (!variety && type != AT_VALID_VALUE && type != AT_SD_VALID_VALUE && type != AT_RANGE)
+            return;
+        vx_data_type_t data_type = see.compiler.data_type();
+        if (!variety && !is_numeric(data_type))
+            return;
+        if (is_low_above_high(variety, data_type, see.value()))
+            report(see, see.value_place(), "the lower bound is above the upper one");
+    }
+};
+
+} // namespace
+
+made_watcher make_number_text(const watcher_setup &setup) {
+    return make<number_text>(setup);
+}
+
+made_watcher make_narrowed(const watcher_setup &setup) {
+    return make<narrowed>(setup);
+}
+
+made_watcher make_octal(const watcher_setup &setup) {
+    return make<octal>(setup);
+}
+
+made_watcher make_low_above_high(const watcher_setup &setup) {
+    return make<low_above_high>(setup);
+}
+
+} // namespace check

@@ -1,0 +1,34 @@
+/* registry.h: all warnings at work. */
+#ifndef CDGEN_CHECK_WARNINGS_REGISTRY_H
+#define CDGEN_CHECK_WARNINGS_REGISTRY_H
+
+#include "check/warnings/watcher.h"
+
+#include <array>
+#include <memory>
+#include <vector>
+
+namespace check {
+
+/* The wanted warnings, which are given each event in turn. */
+class watchers {
+public:
+    watchers(const warning_set &wanted, findings &found);
+
+    void line(const view &see) const;
+    /* All the events of an attribute line. */
+    void attribute(const view &see) const;
+    void stanza_end(const view &see, int next_kind) const;
+    void before_step(const view &see, int next_kind) const;
+    void after_step(const view &see, int next_kind) const;
+    void dropped(const view &see, int kind) const;
+    void source_end(const view &see) const;
+
+private:
+    std::vector<std::unique_ptr<watcher>> all;
+    std::array<std::vector<watcher *>, EVENTS> of_event;
+};
+
+} // namespace check
+
+#endif

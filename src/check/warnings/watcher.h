@@ -1,0 +1,116 @@
+/* watcher.h: a warning at work: it watches a check and reports what it finds. It knows no other warning. */
+#ifndef CDGEN_CHECK_WARNINGS_WATCHER_H
+#define CDGEN_CHECK_WARNINGS_WATCHER_H
+
+#include "check/check.h"
+#include "check/findings.h"
+#include "check/numbers.h"
+#include "check/view.h"
+#include "language/suggestions.h"
+
+#include <memory>
+#include <string>
+#include <type_traits>
+
+namespace check {
+
+/* What a warning is made from. */
+struct watcher_setup {
+    const warning &known;
+    findings &found;
+};
+
+class watcher {
+public:
+    explicit watcher(const watcher_setup &setup) : to(setup) {}
+    watcher(const watcher &) = delete;
+    watcher &operator=(const watcher &) = delete;
+    virtual ~watcher() = default;
+
+    /* ---- Events. A warning overrides those that it has an interest in. */
+
+    /* A line has been read; nothing has been taken from it. */
+    virtual void line(const view &) {}
+    /* The compiler has accepted an attribute line. */
+    virtual void attribute(const view &) {}
+    /* The same, if the attribute surely belongs to the current stanza: first for each number in the value
+     * that is not plain, */
+    virtual void number(const view &, const number_part &) {}
+    /* then for the whole. */
+    virtual void value(const view &) {}
+    /* The current stanza, if there is one, ends; the next one's kind is NO_KIND at the end of the source or if it is
+     * not known. */
+    virtual void stanza_end(const view &, int /* next_kind */) {}
+    /* The compiler is about to take a header, or at the end of the source (NO_KIND) another closing step; */
+    virtual void before_step(const view &, int /* next_kind */) {}
+    /* and it has completed the records that the step completes. */
+    virtual void after_step(const view &, int /* next_kind */) {}
+    /* The latest record of a kind will not be completed: an error of it has been reported. */
+    virtual void dropped(const view &, int /* kind */) {}
+    /* All of the source has been read. */
+    virtual void source_end(const view &) {}
+
+protected:
+    /* With a note, if it has a text. */
+    void report(const place &at, const std::string &source, std::string text, note more = {}) {
+        to.found.warn(to.known, at, source, std::move(text), std::move(more));
+    }
+    /* About the current line. */
+    void report(const view &see, const place &at, std::string text, note more = {}) {
+        report(at, see.line.raw, std::move(text), std::move(more));
+    }
+
+private:
+    watcher_setup to;
+};
+
+/* ---- Which events a warning overrides --------------------------------------------------------------------------- */
+
+enum event {
+    ON_LINE,
+    ON_ATTRIBUTE,
+    ON_NUMBER,
+    ON_VALUE,
+    ON_STANZA_END,
+    ON_BEFORE,
+    ON_AFTER,
+    ON_DROPPED,
+    ON_END,
+    EVENTS
+};
+
+using event_set = std::array<bool, EVENTS>;
+
+/* A function that a class does not override is a member of watcher. */
+template <class Warning> constexpr event_set events_of() {
+    using seeing = void (watcher::*)(const view &);
+    using seeing_kind = void (watcher::*)(const view &, int);
+    using seeing_number = void (watcher::*)(const view &, const number_part &);
+    return {
+        !std::is_same_v<decltype(&Warning::line), seeing>,
+        !std::is_same_v<decltype(&Warning::attribute), seeing>,
+        !std::is_same_v<decltype(&Warning::number), seeing_number>,
+        !std::is_same_v<decltype(&Warning::value), seeing>,
+        !std::is_same_v<decltype(&Warning::stanza_end), seeing_kind>,
+        !std::is_same_v<decltype(&Warning::before_step), seeing_kind>,
+        !std::is_same_v<decltype(&Warning::after_step), seeing_kind>,
+        !std::is_same_v<decltype(&Warning::dropped), seeing_kind>,
+        !std::is_same_v<decltype(&Warning::source_end), seeing>,
+    };
+}
+
+struct made_watcher {
+    std::unique_ptr<watcher> warning;
+    event_set events;
+};
+
+template <class Warning> made_watcher make(const watcher_setup &setup) {
+    return {std::make_unique<Warning>(setup), events_of<Warning>()};
+}
+
+/* Each warning's file ends with one. */
+using maker = made_watcher(const watcher_setup &);
+
+} // namespace check
+
+#endif

@@ -1,0 +1,71 @@
+/* places.cpp: places of a source as other programs and people want them. */
+
+#include "report/places.h"
+
+#include "text/shown.h"
+#include "text/utf8.h"
+
+#include <algorithm>
+#include <cctype>
+
+namespace report {
+
+using check::place;
+
+namespace {
+
+/* Blanks and tabs up to the place, then a caret for its first character and a tilde for each further one. */
+std::string carets(std::string_view source, const place &at) {
+    std::string text;
+    size_t begin = std::min(at.column - 1, source.size());
+    for (size_t i = 0; i < begin; i += text::length_or_1(source.substr(i)))
+        text += source[i] == '\t' ? '\t' : ' ';
+    size_t end = begin + std::min(at.length, source.size() - begin);
+    size_t width = 0;
+    for (size_t i = begin; i < end; i += text::length_or_1(source.substr(i)))
+        ++width;
+    return text + "^" + std::string(width > 1 ? width - 1 : 0, '~');
+}
+
+} // namespace
+
+std::string prefix_of(std::string_view file, const place &at) {
+    std::string text = text::masked(file) + ":";
+    if (at.line != 0)
+        text += std::to_string(at.line) + ":";
+    if (at.line != 0 && at.column != 0)
+        text += std::to_string(at.column) + ":";
+    return text + " ";
+}
+
+std::string excerpt_of(const place &at, std::string_view source) {
+    constexpr size_t MARGIN = 5;
+    if (at.line == 0 || at.column == 0)
+        return {};
+    std::string number = std::to_string(at.line);
+    std::string margin(std::max(number.size(), MARGIN), ' ');
+    return margin.substr(number.size()) + number + " | " + text::masked(source) + "\n" + margin + " | " +
+           carets(source, at) + "\n";
+}
+
+std::string uri_of(std::string_view file) {
+    constexpr const char *HEXADECIMAL = "0123456789ABCDEF";
+    std::string uri;
+    for (char c : file) {
+        auto byte = static_cast<unsigned char>(c);
+        bool plain = std::isalnum(byte) != 0 || std::string_view("-._~/").find(c) != std::string_view::npos;
+        if (plain)
+            uri += c;
+        else
+            uri += {'%', HEXADECIMAL[byte >> 4], HEXADECIMAL[byte & 15]};
+    }
+    return uri;
+}
+
+size_t characters_in(std::string_view source, size_t bytes) {
+    auto text = source.substr(0, bytes);
+    return static_cast<size_t>(
+        std::count_if(text.begin(), text.end(), [](char c) { return (static_cast<unsigned char>(c) & 0xC0) != 0x80; }));
+}
+
+} // namespace report

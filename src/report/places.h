@@ -1,0 +1,28 @@
+/* places.h: places of a source as other programs and people want them. Pure functions of texts. */
+#ifndef CDGEN_REPORT_PLACES_H
+#define CDGEN_REPORT_PLACES_H
+
+#include "check/check.h"
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+
+namespace report {
+
+/* "file:line:column: ", as much of it as the place has. */
+std::string prefix_of(std::string_view file, const check::place &at);
+
+/* The source's line with its number, and below it a caret for each character of the place; empty for a place without
+ * column. */
+std::string excerpt_of(const check::place &at, std::string_view source);
+
+/* A relative or absolute path as a URI reference: bytes that must not stand in one are written as %XX. */
+std::string uri_of(std::string_view file);
+
+/* UTF-8 characters that begin in the first bytes of a text. */
+std::size_t characters_in(std::string_view source, std::size_t bytes);
+
+} // namespace report
+
+#endif

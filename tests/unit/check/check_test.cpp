@@ -1,0 +1,77 @@
+/* The checking library: bytes in, findings out. */
+
+#include "check/found_in.h"
+
+namespace {
+
+using found_in::CLASS;
+using found_in::codes;
+using found_in::findings_in;
+using found_in::found_in;
+using found_in::persistent;
+
+TEST(Check, FindsNothingInASoundSource) {
+    check::totals count = check::check_bytes(CLASS, "x", found_in::all_warnings(), [](check::finding &&) { FAIL(); });
+    EXPECT_EQ(count.errors, 0u);
+    EXPECT_EQ(count.warnings, 0u);
+}
+
+TEST(Check, CountsWhatItHandsOver) {
+    std::string source = CLASS + persistent("A", "x", "Sting", "\tDefaultValue=1\n");
+    size_t handed = 0;
+    check::totals count =
+        check::check_bytes(source, "x", found_in::all_warnings(), [&](check::finding &&) { ++handed; });
+    EXPECT_EQ(count.errors, 1u);
+    EXPECT_EQ(count.warnings, 1u);
+    EXPECT_EQ(handed, 2u);
+}
+
+TEST(Check, HandsFindingsOverByLine) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "SDx") + "DynamicResourceAttribute\n\tName=B\n"),
+              (codes{"S202 21:11+3", "S111 24"}));
+    EXPECT_EQ(found_in(""), (codes{"S301 0", "S302 0"}));
+}
+
+TEST(Check, TakesSourcesLargerThanTheReadBuffer) {
+    std::string comments(200000, '\n');
+    EXPECT_EQ(found_in(CLASS + comments + "Unknwon\n"), codes{"S101 200016:1+7"});
+}
+
+TEST(Check, TakesEveryByte) {
+    std::string bytes = CLASS;
+    for (int byte = 0; byte < 256; ++byte)
+        bytes += static_cast<char>(byte);
+    EXPECT_FALSE(found_in(bytes).empty());
+}
+
+TEST(Check, SaysWhichFileCannotBeRead) {
+    try {
+        check::check_file("/nowhere/at all", found_in::all_warnings(), [](check::finding &&) {});
+        FAIL();
+    } catch (const check::cannot_check &failure) {
+        EXPECT_STREQ(failure.what(), "/nowhere/at all: cannot open because: No such file or directory");
+    }
+}
+
+TEST(Recovery, ReportsAMisspeltPermissionAfterASecondName) {
+    EXPECT_EQ(found_in(CLASS + "ResourceAction\n\tName=A\n\tDescription=3\n\tDisplayName=4\n\tId=0\n"
+                               "\tVarietyRange=1,1\n\tName=B\n\tPermision=x\n"),
+              (codes{"S109 22:2+4", "S106 23:2+9"}));
+}
+
+TEST(Recovery, ReportsAWarningNotBesideTheErrorThatExplainsIt) {
+    std::string element = "DefineSDDefinition\n\tElementName=F\n\tDescription=5\n\tDisplayName=6\n\tDataType=Int32\n";
+    EXPECT_EQ(found_in(CLASS + element), codes{"S515 16:1+18"});
+    EXPECT_EQ(found_in(CLASS + element + found_in::element("DefineSDDefinition", "Int32", "1")), codes{"S210 25:15+1"});
+}
+
+TEST(Recovery, ShowsAValueOfALineThatWasTakenAgain) {
+    std::string source = CLASS;
+    source.replace(source.find("\tFirstKey=1"), 11, "FirstKey=9");
+    std::vector<check::finding> found = findings_in(source);
+    ASSERT_EQ(found.size(), 2u);
+    EXPECT_EQ(found_in::shown(found[1]), "S304 15");
+    EXPECT_EQ(found[1].notes.at(0).at.column, 10u);
+}
+
+} // namespace

@@ -1,0 +1,51 @@
+/* Texts, each with the line that gave it first. */
+
+#include "check/first_lines.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+namespace {
+
+using names = std::vector<std::string_view>;
+
+TEST(FirstLines, RemembersTheLineOfAText) {
+    check::first_lines lines;
+    EXPECT_EQ(lines.line_of("a"), 0);
+    lines.line_of("a") = 5;
+    EXPECT_EQ(lines.line_of("a"), 5);
+    EXPECT_EQ(lines.line_of("b"), 0);
+    EXPECT_EQ(lines.all(), (names{"a", "b"}));
+}
+
+TEST(FirstLines, HasWhatWasAskedFor) {
+    check::first_lines lines;
+    EXPECT_FALSE(lines.has("a"));
+    lines.line_of("a") = 1;
+    lines.line_of("") = 2;
+    EXPECT_TRUE(lines.has("a"));
+    EXPECT_TRUE(lines.has(""));
+    EXPECT_FALSE(lines.has("aa"));
+}
+
+TEST(FirstLines, HoldsManyTextsAndNumbers) {
+    check::first_lines texts, numbers;
+    for (int i = 1; i <= 10000; ++i)
+        texts.line_of(std::to_string(i)) = numbers.line_of(static_cast<vx_uint32_t>(i * 64)) = i;
+    for (int i = 1; i <= 10000; ++i) {
+        EXPECT_EQ(texts.line_of(std::to_string(i)), i);
+        EXPECT_EQ(numbers.line_of(static_cast<vx_uint32_t>(i * 64)), i);
+    }
+}
+
+TEST(FirstLines, IsEmptyWhenCleared) {
+    check::first_lines lines;
+    lines.line_of("a") = 1;
+    lines.clear();
+    EXPECT_FALSE(lines.has("a"));
+    EXPECT_EQ(lines.line_of("a"), 0);
+    EXPECT_EQ(lines.all(), names{"a"});
+}
+
+} // namespace

@@ -1,0 +1,188 @@
+/* Each warning, fed with a few lines. */
+
+#include "check/found_in.h"
+#include "messages_document.h"
+
+namespace {
+
+using found_in::CLASS;
+using found_in::codes;
+using found_in::dynamic;
+using found_in::element;
+using found_in::found_in;
+using found_in::persistent;
+
+constexpr const char *RESOURCE = "DynamicResourceAttribute";
+constexpr const char *OF_CLASS = "DynamicClassAttribute";
+
+TEST(Warnings, AreNoneForASoundSource) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "UInt32", "\tDefaultValue=5\n")), codes());
+}
+
+TEST(Warnings, AreSilentWhenSwitchedOff) {
+    check::warning_set wanted = found_in::all_warnings();
+    wanted[check::NARROWED] = false;
+    std::string source = CLASS + persistent("A", "0", "UInt32", "\tDefaultValue=-5\n\tGroupID=010\n");
+    EXPECT_EQ(found_in(source), (codes{"S508 23:15+2", "S509 24:10+3"}));
+    EXPECT_EQ(found_in::findings_in(source, wanted).size(), 1u);
+}
+
+TEST(Warnings, AreExplainedByTheDocumentAsTheRegistryDoes) {
+    std::map<std::string, std::string> document = messages_document::sections();
+    for (const check::warning &row : check::warnings) {
+        std::string title = "### " + std::string(row.code) + " `" + row.name + "`";
+        EXPECT_EQ(document[row.code].substr(0, title.size()), title);
+        EXPECT_EQ(messages_document::body_of(document[row.code]), messages_document::words(row.cause, row.cure));
+        document.erase(row.code);
+    }
+    for (const auto &[code, section] : document)
+        EXPECT_FALSE(code.starts_with("S5")) << section;
+}
+
+/* ---- Lines ----------------------------------------------------------------------------------------------------- */
+
+TEST(LongLine, IsReportedOnceAtItsFirstPiece) {
+    std::string pieces = "#" + std::string(253, 'x') + "#" + std::string(253, 'x');
+    EXPECT_EQ(found_in(CLASS + "#" + std::string(252, 'x') + "\n"), codes());
+    EXPECT_EQ(found_in(CLASS + "#" + std::string(253, 'x') + "\n"), codes{"S516 16"});
+    EXPECT_EQ(found_in(CLASS + pieces + "#\n"), codes{"S516 16"});
+}
+
+TEST(CarriageReturn, IsReportedOnce) {
+    EXPECT_EQ(found_in(CLASS + "# one\r\n# two\r\n"), codes{"S517 16:6+1"});
+    EXPECT_EQ(found_in(CLASS + "# o\rne\n"), codes{"S517 16:4+1"});
+}
+
+/* ---- Values ---------------------------------------------------------------------------------------------------- */
+
+TEST(TextAfterQuote, IsReportedFromTheQuote) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tDefaultValue=\"a\"b\"\n")), codes{"S520 23:17+2"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tDefaultValue=\"a\\\"b\"\n")), codes());
+}
+
+TEST(NumberText, IsReportedForTextAfterANumberAndForNone) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "7 x", "UInt32")), codes{"S510 20:5+3"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "x", "UInt32")), codes{"S510 20:5+1"});
+}
+
+TEST(Narrowed, IsReportedForWhatDoesNotFit) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "4294967295", "Int32")), codes());
+    EXPECT_EQ(found_in(CLASS + persistent("A", "4294967296", "Int32")), codes{"S508 20:5+10"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tDefaultValue=2147483648\n")), codes{"S508 23:15+10"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "UInt64", "\tDefaultValue=-1\n")), codes{"S508 23:15+2"});
+}
+
+TEST(Octal, IsReportedIfItChangesTheValue) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "010", "UInt32")), codes{"S509 20:5+3"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "007", "UInt32")), codes());
+}
+
+TEST(Numbers, AreReportedPartByPart) {
+    EXPECT_EQ(found_in("ControlDefinition\n\tFileVersion=x.256\n" + CLASS.substr(CLASS.find("Res"))),
+              (codes{"S510 2:14+1", "S508 2:16+3"}));
+}
+
+TEST(LowAboveHigh, IsReportedForNumbersOnly) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tValidValue=1,-1\n")), codes{"S519 23:13+4"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Float32", "\tValidValue=1.5,1.25\n")), codes{"S519 23:13+8"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tValidValue=-1,1\n")), codes());
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tValidValue=b,a\n")), codes());
+}
+
+TEST(UnusedDefault, IsReportedForClassAttributes) {
+    std::string stanza = persistent("A", "0", "Int32", "\tDefaultValue=1\n");
+    EXPECT_EQ(found_in(CLASS + stanza), codes());
+    EXPECT_EQ(found_in(CLASS + stanza.replace(0, 27, "PersistentClassAttribute")), codes{"S511 23:2+12"});
+}
+
+TEST(Permission, IsOneKnownLetter) {
+    std::string action = CLASS + "ResourceAction\n\tName=A\n\tDescription=3\n\tDisplayName=4\n\tId=0\n"
+                                 "\tVarietyRange=1,1\n\tPermission=";
+    EXPECT_EQ(found_in(action + "q\n"), codes());
+    EXPECT_EQ(found_in(action + "z\n"), codes{"S512 22:13+1"});
+    EXPECT_EQ(found_in(action + "qx\n"), codes{"S512 22:13+2"});
+}
+
+/* ---- Names and Ids --------------------------------------------------------------------------------------------- */
+
+TEST(SameName, IsReportedWithinAKind) {
+    std::string source = CLASS + persistent("A", "0", "Int32") + persistent("A", "1", "Int32");
+    EXPECT_EQ(found_in(source), codes{"S506 24:7+1"});
+    EXPECT_EQ(found_in::findings_in(source).at(0).notes.at(0).at.line, 17);
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32") + dynamic(RESOURCE, "A", "0")), codes());
+}
+
+TEST(SameId, IsReportedForEqualNumbers) {
+    std::string source = CLASS + persistent("A", "16", "Int32") + persistent("B", "0x10", "Int32");
+    EXPECT_EQ(found_in(source), codes{"S507 27:5+4"});
+}
+
+TEST(UnknownLocator, IsReportedWithoutErrorsOnly) {
+    std::string source = CLASS;
+    source.insert(source.find("ClassTo"), "\tLocator=Nmae\n");
+    EXPECT_EQ(found_in(source + persistent("Name", "0", "String")), codes{"S504 10:10+4"});
+    EXPECT_EQ(found_in(source + persistent("Nmae", "0", "String")), codes());
+    EXPECT_EQ(found_in(source + persistent("Name", "0", "Sting")), codes{"S202 22:11+5"});
+}
+
+TEST(UnknownVariableClass, IsReportedOnceForEachName) {
+    std::string source =
+        CLASS + dynamic(RESOURCE, "A", "0", "\tVariableClass=V\n") + dynamic(RESOURCE, "B", "1", "\tVariableClass=V\n");
+    std::string defined = "ResourceVariableClass\n\tVariableClass=V\n\tObservationInterval=1\n\tReportingInterval=1\n";
+    EXPECT_EQ(found_in(source), codes{"S505 24:16+1"});
+    EXPECT_EQ(found_in(source + defined), codes());
+}
+
+/* ---- Stanzas and runs ------------------------------------------------------------------------------------------ */
+
+TEST(Incomplete, IsReportedAtTheHeader) {
+    std::string source = CLASS;
+    source.erase(source.find("\tLastKey=2\n"), 11);
+    source.insert(source.find("\tFirstKey=1\n") + 11, " # 0");
+    EXPECT_EQ(found_in(source.replace(source.find("Key=1"), 5, "Key=0")), codes{"S515 10:1+21"});
+}
+
+TEST(CutShort, IsReportedForAnOpenAttribute) {
+    std::string second = CLASS.substr(0, CLASS.find("ClassTo"));
+    EXPECT_EQ(found_in(CLASS + second), codes());
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32") + second), codes{"S514 23:1+17"});
+}
+
+TEST(SdWithoutRun, IsReportedUnlessElementsFollow) {
+    std::string attribute = persistent("A", "0", "SD");
+    EXPECT_EQ(found_in(CLASS + attribute + persistent("B", "1", "Int32")), codes{"S502 16:1+27"});
+    EXPECT_EQ(found_in(CLASS + attribute + element("PAttrSDDefinition", "Int32") + persistent("B", "1", "Int32")),
+              codes());
+}
+
+TEST(SdRunAtEnd, IsReportedIfNothingFollows) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "SD") + element("PAttrSDDefinition", "Int32")),
+              codes{"S501 16:1+27"});
+}
+
+TEST(StrayRun, IsReportedWithoutAnAction) {
+    EXPECT_EQ(found_in(CLASS + element("ActionInSDDefinition", "Int32")), codes{"S518 16:1+20"});
+    EXPECT_EQ(found_in(CLASS +
+                       "ResourceAction\n\tName=A\n\tDescription=3\n\tDisplayName=4\n\tId=0\n"
+                       "\tVarietyRange=1,1\n" +
+                       element("ActionInSDDefinition", "Int32")),
+              codes());
+}
+
+TEST(ElementType, IsReportedWhereTheCompilerAcceptsIt) {
+    EXPECT_EQ(found_in(CLASS + element("DefineSDDefinition", "Sting")), codes{"S513 21:11+5"});
+}
+
+TEST(RangeElsewhere, IsReportedIfTheOtherKindIsOpen) {
+    EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "A", "0") + dynamic(OF_CLASS, "B", "1", "\tRange=1,2\n")),
+              codes{"S503 32:2+9"});
+}
+
+TEST(RangeElsewhere, IsReportedIfTheOtherKindIsCompletedFirst) {
+    EXPECT_EQ(found_in(CLASS + dynamic(OF_CLASS, "A", "0") + dynamic(RESOURCE, "B", "1", "\tRange=1,2\n") +
+                       dynamic(OF_CLASS, "C", "2")),
+              codes{"S503 32:2+9"});
+    EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "B", "1", "\tRange=1,2\n")), codes());
+}
+
+} // namespace

@@ -115,7 +115,7 @@ inline constexpr side_table side_tables[] = {
 
 /* The first so many of them are tables of records; the first four, of attributes. */
 inline constexpr std::size_t TABLES_OF_RECORDS = static_cast<std::size_t>(std::count_if(
-    std::begin(side_tables), std::end(side_tables), [](const side_table &t) { return t.record != nullptr; }));
+    std::begin(side_tables), std::end(side_tables), [](const side_table &t) { return t.count != nullptr; }));
 inline constexpr std::size_t TABLES_OF_ATTRIBUTES = 4;
 
 /* In the order in which the compiler makes them. */

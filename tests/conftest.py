@@ -20,13 +20,13 @@ def pytest_addoption(parser):
     group.addoption("--runner", default="", help="the command that runs it")
     group.addoption("--cases", type=int, help="how many generated sources; by default 20000, under sanitizers fewer")
     group.addoption("--keep", type=pathlib.Path, help="where to leave generated sources that fail")
-    group.addoption("--first", type=int, default=0, help="the first seed of generated sources")
+    group.addoption("--round", type=int, default=0, help="other generated sources: each round has its own")
 
 
 def pytest_configure(config):
     """Before any test is collected."""
     PROGRAMS.use(config.getoption("build"), config.getoption("cdgen"), config.getoption("native"))
-    PROGRAMS.cases, PROGRAMS.first = config.getoption("cases"), config.getoption("first")
+    PROGRAMS.cases, PROGRAMS.round = config.getoption("cases"), config.getoption("round")
     there = config.getoption("there")
     PROGRAMS.there, PROGRAMS.runner = there and there.resolve(), config.getoption("runner")
     PROGRAMS.keep = config.getoption("keep")

@@ -160,11 +160,12 @@ def count():
 
 
 def made(seeds, group):
-    """The sources of a group, half of either kind."""
+    """The sources of a group in this round, half of either kind."""
     share = count() // GROUPS
-    for text in generated(seeds, share // 2, PROGRAMS.first + group):
+    number = PROGRAMS.round * GROUPS + group
+    for text in generated(seeds, share // 2, number):
         yield text.encode()
-    yield from mutated(share - share // 2, PROGRAMS.first + group)
+    yield from mutated(share - share // 2, number)
 
 
 @pytest.mark.slow(8)

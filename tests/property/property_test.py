@@ -406,10 +406,11 @@ def check_determined(seeds):
 
 
 def seeds_of(group):
-    """The seeds of a group; a sanitizer gets fewer."""
+    """The seeds of a group in this round; a sanitizer gets fewer."""
     cases = PROGRAMS.cases or (SANITIZED_CASES if PROGRAMS.sanitizers else CASES)
     each = -(-cases // GROUPS)
-    return range(PROGRAMS.first + group * each, PROGRAMS.first + (group + 1) * each)
+    first = (PROGRAMS.round * GROUPS + group) * each
+    return range(first, first + each)
 
 
 @pytest.mark.slow(3)

@@ -1,0 +1,43 @@
+"""Which changes script/mutate makes."""
+
+import pytest
+
+from scripts import script
+
+MUTATE = script("mutate")
+
+
+def changes(text):
+    """Every version of a text with one token changed."""
+    return [MUTATE.changed(text, mutant) for mutant in MUTATE.mutants_of("x.cpp", text)]
+
+
+@pytest.mark.parametrize("text, expected", [
+    ("if (a == b)", ["if (a != b)"]),
+    ("a <= b && c", ["a < b && c", "a <= b || c"]),
+    ("f(!done)", ["f(done)"]),
+    ("x = 0x0F;", ["x = 0x10;"]),
+    ("x = 010;", ["x = 9;"]),
+    ("i++;\nreturn true;", ["i--;\nreturn true;", "i++;\nreturn false;"]),
+    ("a - b", ["a + b"]),
+])
+def test_changes(text, expected):
+    """Operators, steps, words and numbers, one at a time."""
+    assert changes(text) == expected
+
+
+@pytest.mark.parametrize("text", [
+    'say("a == 1")', "c = '1';", "// a == 1", "/* a\n == 1 */", "#define A 1", "std::vector<int> a;", "int *a; int &b;",
+    "uint32_t a1;", "1.5f", "1'000", "static_assert(a == 1);",
+])
+def test_leaves_alone(text):
+    """Texts, comments, types, names, and what only the compiler sees."""
+    assert changes(text) == []
+
+
+def test_an_id_moves_with_its_line():
+    """The same line further down has the same changes; a second one like it has others."""
+    (one,) = MUTATE.mutants_of("x.cpp", "a == b;\n")
+    moved, second = MUTATE.mutants_of("x.cpp", "\n\na == b;\na == b;\n")
+    assert (moved.id, moved.line) == (one.id, 3)
+    assert second.id != one.id

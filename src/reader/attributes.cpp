@@ -39,13 +39,13 @@ template <class Record>
 void attribute_walk::walk_attribute(const location &place, std::size_t offset, vx_uint32_t id, bool is_last_of_table) {
     auto record = tables.section.record<Record>(offset);
     out.visit<Record>(place, tables.section, offset);
-    out.expect_id(place, "ra_cb_ID", record.ra_cb_ID, id);
+    out.expect_id(place, fields_of<Record>.front().name, record.ra_cb_ID, id);
     references.expect_data_type(place, *format_for<Record>.type, record.ra_data_type);
     if constexpr (std::is_same_v<Record, rsrc_dattr_t>) {
         std::uint32_t mark = id == CDB_ID_DATTR_C ? VAR_ID_CLASS_ATTR : 0;
         dynamic_ids.push_back(static_cast<var_id_t>(record.ra_attr_id) | mark);
         if (record.ra_var_type > ORB_QUANTUM)
-            out.report(check::VARIABLE_TYPE, place, "ra_var_type", place.offset + offsetof(rsrc_dattr_t, ra_var_type),
+            out.report(check::VARIABLE_TYPE, place, field_of<rsrc_dattr_t>(offsetof(rsrc_dattr_t, ra_var_type)),
                        std::to_string(record.ra_var_type), "0 to 3");
     }
     references.take_found_shared();
@@ -75,8 +75,8 @@ template <class Record> void attribute_walk::check_structure(const location &pla
     bool absent = record.u_ra_sd.offset[0] == CDB_NONE;
     std::size_t elements = std::size_t{record.ra_max_sd_idx} + 1;
     if (absent || elements != definition.size())
-        out.report(check::SD_MISSING, place, absent ? "u_ra_sd" : "ra_max_sd_idx",
-                   place.offset + (absent ? offsetof(Record, u_ra_sd) : offsetof(Record, ra_max_sd_idx)),
+        out.report(check::SD_MISSING, place,
+                   field_of<Record>(absent ? offsetof(Record, u_ra_sd) : offsetof(Record, ra_max_sd_idx)),
                    absent ? "none" : std::to_string(record.ra_max_sd_idx),
                    absent ? "a definition" : std::to_string(definition.size()) + " elements");
     attribute<Record> attr(tables, place.offset - at.offset);

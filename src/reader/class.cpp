@@ -35,7 +35,7 @@ private:
 };
 
 /* The field of the class record that says where a table is. */
-const field &field_of(const side_table &table) {
+const field &ref_field(const side_table &table) {
     static const rsrc_class_t record = {};
     const void *ref = &(record.*table.ref);
     return field_at(class_fields, static_cast<std::size_t>(static_cast<const std::byte *>(ref) -
@@ -48,7 +48,7 @@ void class_walk::check_tables() {
     for (const side_table &table : side_tables) {
         std::size_t offset = (rc.*table.ref).offset[0];
         bool unlocated = table.form == table_form::UNLOCATED && offset == 0;
-        const field &f = field_of(table);
+        const field &f = ref_field(table);
         if (!unlocated && offset != end)
             out.report(check::TABLE_PLACE, at, f.name, at.offset + f.offset, offset, end);
         end += table.size_in(rc);
@@ -64,7 +64,7 @@ void class_walk::check_tables() {
 /* The strings end the section. strings_at: where they start. */
 void class_walk::check_end(std::size_t strings_at) {
     if ((section.size() - strings_at) % extent::UNIT != 0)
-        out.report(check::SECTION_LENGTH, at, "u_rc_strings", at.offset + offsetof(rsrc_class_t, u_rc_strings),
+        out.report(check::SECTION_LENGTH, at, field_of<rsrc_class_t>(offsetof(rsrc_class_t, u_rc_strings)),
                    std::to_string(section.size() - strings_at) + " bytes of strings", "a multiple of 8");
 }
 
@@ -81,7 +81,7 @@ void class_walk::walk_actions(const cdb_ref_t &table, std::size_t count, vx_uint
     location place = {at.section, "rsrc_action_t", 0, at.offset + offset};
     for (; place.index < count; ++place.index, offset += sizeof(rsrc_action_t), place.offset += sizeof(rsrc_action_t)) {
         out.visit<rsrc_action_t>(place, section, offset);
-        out.expect_id(place, "ac_cb_ID", section.number<vx_uint32_t>(offset), id);
+        out.expect_id(place, fields_of<rsrc_action_t>.front().name, section.number<vx_uint32_t>(offset), id);
         references.follow(place, section, offset, leading_fields_of<rsrc_action_t>, VX_UNKNOWN);
     }
 }
@@ -114,7 +114,7 @@ void class_walk::walk_depends() {
 /* References that may mean nothing wait until everything with a certain owner is claimed. */
 void class_walk::run() {
     out.visit<rsrc_class_t>(at, section, 0);
-    out.expect_id(at, "rc_cb_ID", rc.rc_cb_ID, CDB_ID_CLASS);
+    out.expect_id(at, fields_of<rsrc_class_t>.front().name, rc.rc_cb_ID, CDB_ID_CLASS);
     check_tables();
     walk_attributes();
     references.names_may_be_unset = true;

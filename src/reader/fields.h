@@ -11,6 +11,10 @@ constexpr const field &field_at(std::span<const field> fields, std::size_t offse
     return *std::find_if(fields.begin(), fields.end(), [offset](const field &f) { return f.offset == offset; });
 }
 
+template <class Record> constexpr const field &field_of(std::size_t offset) {
+    return field_at(fields_of<Record>, offset);
+}
+
 /* The fields of a record that meet a condition. */
 template <class Record, auto Condition> struct picked_fields {
     static constexpr std::size_t count =

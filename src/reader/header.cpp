@@ -15,10 +15,11 @@ namespace {
 void check_length(reporter &out, const database &db) {
     std::size_t expected = db.file().size() - sizeof(cdb_uint32_t);
     if (db.header().cdb_hdr_length != expected)
-        out.report(check::FILE_LENGTH, whole_file, "cdb_hdr_length", offsetof(orb_cdb_header_t, cdb_hdr_length),
-                   db.header().cdb_hdr_length, expected);
+        out.report(check::FILE_LENGTH, whole_file,
+                   field_of<orb_cdb_header_t>(offsetof(orb_cdb_header_t, cdb_hdr_length)), db.header().cdb_hdr_length,
+                   expected);
     if (!db.recognised())
-        out.report(check::FORMAT, whole_file, "cdb_hdr_format", offsetof(orb_cdb_header_t, cdb_hdr_format),
+        out.report(check::FORMAT, whole_file, field_of<orb_cdb_header_t>(offsetof(orb_cdb_header_t, cdb_hdr_format)),
                    text::hex(db.header().cdb_hdr_format), text::hex(CDB_FORMAT));
 }
 
@@ -48,7 +49,8 @@ void check_checksum(reporter &out, const database &db) {
     std::uint32_t sum = xor_of_words(raw.subspan(FIRST, words * WORD), raw.data());
     auto expected = bytes(std::as_bytes(std::span(&sum, 1)), db.order()).number<std::uint32_t>(0);
     if (expected != db.header().cdb_hdr_checksum)
-        out.report(check::CHECKSUM, whole_file, "cdb_hdr_checksum", offsetof(orb_cdb_header_t, cdb_hdr_checksum),
+        out.report(check::CHECKSUM, whole_file,
+                   field_of<orb_cdb_header_t>(offsetof(orb_cdb_header_t, cdb_hdr_checksum)),
                    text::hex(db.header().cdb_hdr_checksum), text::hex(expected));
 }
 
@@ -80,11 +82,13 @@ void check_largest_ids(reporter &out, const database &db) {
     for (const resource_class &c : db.classes())
         class_id = std::max(class_id, c.record().rc_class_id);
     if (db.header().cdb_hdr_max_rm_id != manager_id)
-        out.report(check::LARGEST_ID, whole_file, "cdb_hdr_max_rm_id", offsetof(orb_cdb_header_t, cdb_hdr_max_rm_id),
+        out.report(check::LARGEST_ID, whole_file,
+                   field_of<orb_cdb_header_t>(offsetof(orb_cdb_header_t, cdb_hdr_max_rm_id)),
                    db.header().cdb_hdr_max_rm_id, manager_id);
     if (db.header().cdb_hdr_max_class_id != class_id)
-        out.report(check::LARGEST_ID, whole_file, "cdb_hdr_max_class_id",
-                   offsetof(orb_cdb_header_t, cdb_hdr_max_class_id), db.header().cdb_hdr_max_class_id, class_id);
+        out.report(check::LARGEST_ID, whole_file,
+                   field_of<orb_cdb_header_t>(offsetof(orb_cdb_header_t, cdb_hdr_max_class_id)),
+                   db.header().cdb_hdr_max_class_id, class_id);
 }
 
 } // namespace cdb

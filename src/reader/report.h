@@ -35,6 +35,14 @@ public:
     void report(check broken, const location &at, std::string_view field, std::size_t offset, std::uint64_t found,
                 std::uint64_t expected);
 
+    /* Both at a field of the record that is there. */
+    void report(check broken, const location &at, const field &f, std::string found, std::string expected) {
+        report(broken, at, f.name, at.offset + f.offset, std::move(found), std::move(expected));
+    }
+    void report(check broken, const location &at, const field &f, std::uint64_t found, std::uint64_t expected) {
+        report(broken, at, f.name, at.offset + f.offset, found, expected);
+    }
+
     void add_region(const location &at, std::size_t offset, std::size_t size, std::string_view name,
                     const field *what = nullptr) {
         if (regions != nullptr && size > 0)

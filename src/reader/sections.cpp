@@ -17,7 +17,7 @@ static void expect_filled_up(reporter &out, const location &at, const bytes &sec
 void walk_manager(reporter &out, const location &at, const bytes &section) {
     auto record = section.record<rsrc_mgr_t>(0);
     out.visit<rsrc_mgr_t>(at, section, 0);
-    out.expect_id(at, "rm_cb_ID", record.rm_cb_ID, CDB_ID_MGR);
+    out.expect_id(at, fields_of<rsrc_mgr_t>.front().name, record.rm_cb_ID, CDB_ID_MGR);
     text_walk texts(out, at, section.part(sizeof record), at.offset + sizeof record);
     texts.visit(at, field_at(mgr_fields, offsetof(rsrc_mgr_t, u_rm_RMname)), record.u_rm_RMname.offset[0], true);
     texts.finish();
@@ -27,11 +27,11 @@ void walk_manager(reporter &out, const location &at, const bytes &section) {
 void walk_map(reporter &out, const location &at, const bytes &section) {
     auto record = section.record<rsrc_cmmap_t>(0);
     out.visit<rsrc_cmmap_t>(at, section, 0);
-    out.expect_id(at, "rcm_cb_ID", record.rcm_cb_ID, CDB_ID_CMMAP);
+    out.expect_id(at, fields_of<rsrc_cmmap_t>.front().name, record.rcm_cb_ID, CDB_ID_CMMAP);
     std::size_t strings_at = record.u_rcm_strings.offset[0];
     if (strings_at != sizeof record)
-        out.report(check::TABLE_PLACE, at, "u_rcm_strings", at.offset + offsetof(rsrc_cmmap_t, u_rcm_strings),
-                   strings_at, sizeof record);
+        out.report(check::TABLE_PLACE, at, field_of<rsrc_cmmap_t>(offsetof(rsrc_cmmap_t, u_rcm_strings)), strings_at,
+                   sizeof record);
     text_walk texts(out, at, section.part(strings_at), at.offset + strings_at);
     texts.visit(at, field_at(cmmap_fields, offsetof(rsrc_cmmap_t, u_rcm_msg_file)), record.u_rcm_msg_file.offset[0],
                 true);
@@ -44,8 +44,9 @@ static void walk_variable_ids(reporter &out, const location &record_at, const by
                               std::size_t count, std::span<const var_id_t> dynamic_ids) {
     std::size_t length = extent::units(count * sizeof(var_id_t)) * extent::UNIT;
     if (first + length != section.size())
-        out.report(check::SECTION_LENGTH, record_at, "rvc_var_count",
-                   record_at.offset + offsetof(rsrc_variable_class_t, rvc_var_count), section.size(), first + length);
+        out.report(check::SECTION_LENGTH, record_at,
+                   field_of<rsrc_variable_class_t>(offsetof(rsrc_variable_class_t, rvc_var_count)), section.size(),
+                   first + length);
     count = count_inside(section, first, count, sizeof(var_id_t));
     location at = {record_at.section, "var_id_t", 0, record_at.offset + first};
     for (; at.index < count; ++at.index, at.offset += sizeof(var_id_t)) {
@@ -64,7 +65,7 @@ void walk_variable_class(reporter &out, const location &at, const bytes &section
                          std::span<const var_id_t> dynamic_ids) {
     auto record = section.record<rsrc_variable_class_t>(0);
     out.visit<rsrc_variable_class_t>(at, section, 0);
-    out.expect_id(at, "rvc_cb_ID", record.rvc_cb_ID, CDB_ID_VARIABLE_CLASS);
+    out.expect_id(at, fields_of<rsrc_variable_class_t>.front().name, record.rvc_cb_ID, CDB_ID_VARIABLE_CLASS);
     std::size_t strings_size = record.u_rvc_string_tbl.offset[0];
     text_walk texts(out, at, section.part(sizeof record, strings_size), at.offset + sizeof record);
     texts.visit(at, field_at(variable_class_fields, offsetof(rsrc_variable_class_t, u_rvc_name)),
@@ -73,9 +74,9 @@ void walk_variable_class(reporter &out, const location &at, const bytes &section
                 record.u_rvc_compat_name.offset[0], true);
     texts.finish();
     if (strings_size % extent::UNIT != 0)
-        out.report(check::REFERENCE_UNALIGNED, at, "u_rvc_string_tbl",
-                   at.offset + offsetof(rsrc_variable_class_t, u_rvc_string_tbl), std::to_string(strings_size),
-                   "a multiple of 8");
+        out.report(check::REFERENCE_UNALIGNED, at,
+                   field_of<rsrc_variable_class_t>(offsetof(rsrc_variable_class_t, u_rvc_string_tbl)),
+                   std::to_string(strings_size), "a multiple of 8");
     walk_variable_ids(out, at, section, sizeof record + strings_size, record.rvc_var_count, dynamic_ids);
 }
 
@@ -84,8 +85,8 @@ void walk_class_hash(reporter &out, const location &at, const bytes &section) {
     out.visit<rsrc_class_hash_t>(at, section, 0);
     std::size_t count = section.number<std::uint32_t>(offsetof(rsrc_class_hash_t, rch_num_hash_blocks));
     if (BLOCKS + count * sizeof(rc_hash_block_t) != section.size())
-        out.report(check::SECTION_LENGTH, at, "rch_num_hash_blocks",
-                   at.offset + offsetof(rsrc_class_hash_t, rch_num_hash_blocks), section.size(),
+        out.report(check::SECTION_LENGTH, at,
+                   field_of<rsrc_class_hash_t>(offsetof(rsrc_class_hash_t, rch_num_hash_blocks)), section.size(),
                    BLOCKS + count * sizeof(rc_hash_block_t));
     location block = {at.section, "rc_hash_block_t", 0, at.offset + BLOCKS};
     for (count = count_inside(section, BLOCKS, count, sizeof(rc_hash_block_t)); block.index < count; ++block.index) {

@@ -49,15 +49,15 @@ std::size_t file_walk::find_last_class(const database &db) {
 /* Sections follow each other without gaps. One that overlaps those before it is not walked: the work must not depend on
  * how many anchors lead to the same bytes. */
 bool file_walk::place_section(const location &at, const cdb_dsect_anchor_t &anchor) {
-    std::size_t place = at.offset + offsetof(cdb_dsect_anchor_t, cda_offset);
+    const field &placed = field_of<cdb_dsect_anchor_t>(offsetof(cdb_dsect_anchor_t, cda_offset));
     if (!db.file().holds(anchor.cda_offset, anchor.cda_length)) {
-        out.report(check::SECTION_OUTSIDE, at, "cda_offset", place,
+        out.report(check::SECTION_OUTSIDE, at, placed,
                    std::to_string(anchor.cda_offset) + " + " + std::to_string(anchor.cda_length),
                    "at most " + std::to_string(db.file().size()));
         return false;
     }
     if (anchor.cda_offset != sections_end)
-        out.report(check::SECTION_PLACE, at, "cda_offset", place, anchor.cda_offset, sections_end);
+        out.report(check::SECTION_PLACE, at, placed, anchor.cda_offset, sections_end);
     if (anchor.cda_offset < sections_end)
         return false;
     sections_end = std::size_t{anchor.cda_offset} + anchor.cda_length;
@@ -76,15 +76,17 @@ void file_walk::walk_anchor(std::size_t index) {
     if (const section_kind *kind = kind_of(anchor.cda_type))
         return walk_section(at, anchor, *kind);
     bool unused = anchor.cda_type < std::size(section_kinds);
-    out.report(unused ? check::SECTION_UNUSED : check::SECTION_TYPE, at, "cda_type", at.offset,
-               std::to_string(anchor.cda_type), "3 to 7");
+    out.report(unused ? check::SECTION_UNUSED : check::SECTION_TYPE, at,
+               field_of<cdb_dsect_anchor_t>(offsetof(cdb_dsect_anchor_t, cda_type)), std::to_string(anchor.cda_type),
+               "3 to 7");
 }
 
 void file_walk::walk_anchors() {
     std::size_t count = db.section_count();
     if (count < db.header().cdb_hdr_dsect_count)
-        out.report(check::ANCHORS_OUTSIDE, whole_file, "cdb_hdr_dsect_count",
-                   offsetof(orb_cdb_header_t, cdb_hdr_dsect_count), db.header().cdb_hdr_dsect_count, count);
+        out.report(check::ANCHORS_OUTSIDE, whole_file,
+                   field_of<orb_cdb_header_t>(offsetof(orb_cdb_header_t, cdb_hdr_dsect_count)),
+                   db.header().cdb_hdr_dsect_count, count);
     sections_end = sizeof(orb_cdb_header_t) + count * sizeof(cdb_dsect_anchor_t);
     for (std::size_t i = 0; i < count; ++i)
         walk_anchor(i);
@@ -96,13 +98,14 @@ void file_walk::walk_anchors() {
 
 void file_walk::walk_section(const location &anchor_at, const cdb_dsect_anchor_t &anchor, const section_kind &kind) {
     if (kind.rank < section_rank)
-        out.report(check::SECTION_ORDER, anchor_at, "cda_type", anchor_at.offset, anchor.cda_type,
+        out.report(check::SECTION_ORDER, anchor_at,
+                   field_of<cdb_dsect_anchor_t>(offsetof(cdb_dsect_anchor_t, cda_type)), anchor.cda_type,
                    type_of_rank(section_rank));
     section_rank = std::max(section_rank, kind.rank);
     if (anchor.cda_length < kind.root->size)
-        out.report(check::SECTION_LENGTH, anchor_at, "cda_length",
-                   anchor_at.offset + offsetof(cdb_dsect_anchor_t, cda_length), std::to_string(anchor.cda_length),
-                   "at least " + std::to_string(kind.root->size));
+        out.report(check::SECTION_LENGTH, anchor_at,
+                   field_of<cdb_dsect_anchor_t>(offsetof(cdb_dsect_anchor_t, cda_length)),
+                   std::to_string(anchor.cda_length), "at least " + std::to_string(kind.root->size));
     else
         walk_section_of(kind.type, {anchor_at.section, kind.root->record, 0, anchor.cda_offset},
                         db.file().part(anchor.cda_offset, anchor.cda_length));

@@ -2,7 +2,7 @@
 
 #include "check/compilation.h"
 
-#include "check/names.h"
+#include "language/names.h"
 
 namespace check {
 
@@ -14,7 +14,7 @@ std::string text_of(const fatal_exit &failure) {
 }
 
 language::name_list compilation::missing(int kind) const {
-    return missing_names(table_of(kind), required_seen(kind));
+    return language::missing_names(table_of(kind), required_seen(kind));
 }
 
 bool compilation::has_index(int kind) const {

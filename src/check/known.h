@@ -5,7 +5,7 @@
 
 #include "check/check.h"
 #include "check/first_lines.h"
-#include "compiler/cdgen.h"
+#include "language/names.h"
 
 #include <algorithm>
 #include <array>
@@ -21,7 +21,7 @@ namespace check {
 constexpr int NO_KIND = -1;      /* no stanza, or one that is skipped */
 constexpr size_t ATTRS_MAX = 32; /* attributes of one kind */
 
-using kind_set = std::bitset<SC_COUNT>;
+using language::kind_set;
 
 constexpr size_t index_of(int kind) {
     return static_cast<size_t>(kind);

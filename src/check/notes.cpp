@@ -2,8 +2,8 @@
 
 #include "check/notes.h"
 
-#include "check/names.h"
 #include "check/numbers.h"
+#include "language/names.h"
 
 #include <algorithm>
 #include <cstdlib>
@@ -85,7 +85,7 @@ std::string belongs_to(const kind_set &kinds) {
 
 void no_stanza(noting &n) {
     std::string text = n.marked();
-    kind_set kinds = kinds_with(std::string_view(text).substr(0, text.find('=')));
+    kind_set kinds = language::kinds_with(std::string_view(text).substr(0, text.find('=')));
     if (kinds.count() == 1)
         n.add_here(belongs_to(kinds));
 }
@@ -96,8 +96,8 @@ void unknown_name(noting &n) {
     std::string_view trimmed = std::string_view(given).substr(0, given.find_last_not_of(" \t") + 1);
     if (trimmed.size() < given.size() && find_attr(table, trimmed) != nullptr)
         return n.add_here("blanks in front of the = belong to the name");
-    kind_set others = kinds_with(given);
-    language::name_list known = attribute_names(table);
+    kind_set others = language::kinds_with(given);
+    language::name_list known = language::attribute_names(table);
     if (near_miss(given, known).empty() && others.count() == 1)
         n.add_here(belongs_to(others));
     else
@@ -133,7 +133,7 @@ void second_map(noting &n) {
 }
 
 void unknown_property(noting &n) {
-    n.add_here(suggestion(n.marked(), property_names(n.see.attr().ta_type)));
+    n.add_here(suggestion(n.marked(), language::property_names(n.see.attr().ta_type)));
 }
 
 void unknown_type(noting &n) {

@@ -1,9 +1,9 @@
 /* recover_attribute.cpp: takes attribute lines, and continues after one that is refused. */
 
-#include "check/names.h"
 #include "check/notes.h"
 #include "check/numbers.h"
 #include "check/recovery.h"
+#include "language/names.h"
 
 namespace check {
 
@@ -117,7 +117,7 @@ void recovery::recover_attribute(const fatal_exit &failure) {
 /* The stanza kind that a line is nearly the name of, although it begins with a blank. */
 std::string_view recovery::header_meant(const fatal_exit &failure) const {
     bool whole = failure.id == MSG_NO_EQUALS || failure.id == MSG_NO_STANZA;
-    return whole ? language::near_miss(line.whole(), stanza_names()) : std::string_view();
+    return whole ? language::near_miss(line.whole(), language::stanza_names()) : std::string_view();
 }
 
 void recovery::indented_header(std::string_view meant, const fatal_exit &failure) {
@@ -125,14 +125,14 @@ void recovery::indented_header(std::string_view meant, const fatal_exit &failure
     finding &error = report(failure, line.all());
     error.notes.push_back({line.all(), "a stanza begins in column 1"});
     if (!exact)
-        error.notes.push_back({line.all(), language::suggestion(line.text.name, stanza_names())});
+        error.notes.push_back({line.all(), language::suggestion(line.text.name, language::stanza_names())});
     take_header(line.replaced(meant), !exact);
 }
 
 /* After an attribute line in front of any header. */
 void recovery::lose_first_header(const fatal_exit &failure) {
     std::string_view text = line.whole();
-    kind_set kinds = kinds_with(text.substr(0, text.find('=')));
+    kind_set kinds = language::kinds_with(text.substr(0, text.find('=')));
     report_with_notes(failure, line.all(), NO_KIND);
     lose_header(kinds.none() ? kinds.set() : kinds);
     skip_stanza();
@@ -147,7 +147,8 @@ std::optional<int> recovery::type_meant() const {
     const srtable_ctrl &table = table_of(known.kind);
     std::string_view name = name_given();
     const table_attrs *attr = find_attr(table, name);
-    if (std::string_view meant = language::near_miss(name, attribute_names(table)); attr == nullptr && !meant.empty())
+    if (std::string_view meant = language::near_miss(name, language::attribute_names(table));
+        attr == nullptr && !meant.empty())
         attr = find_attr(table, meant);
     return attr == nullptr ? std::nullopt : std::optional(attr->ta_type);
 }
@@ -181,7 +182,7 @@ bool recovery::is_misplaced(const fatal_exit &failure) {
         return unknown || repeated || failure.id == MSG_INVALID_VALUE || failure.id == MSG_NO_VALID_VALUE;
     bool first_attribute = compiler.latest().attr == table_of(known.kind).sc_attrs.data();
     bool named = repeated && (first_attribute || is_name(name_given()));
-    kind_set kinds = unknown || named ? kinds_with(name_given()) : kind_set();
+    kind_set kinds = unknown || named ? language::kinds_with(name_given()) : kind_set();
     before = kinds.any();
     if (!before)
         return false;

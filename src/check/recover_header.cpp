@@ -1,7 +1,7 @@
 /* recover_header.cpp: takes headers, and continues after one that is refused. */
 
-#include "check/names.h"
 #include "check/recovery.h"
+#include "language/names.h"
 
 #include <string>
 
@@ -173,8 +173,8 @@ void recovery::unknown_header(const attr_text &text, const fatal_exit &failure) 
         add("an attribute line begins with a blank or a tab");
         return take_quietly(std::string("\t").append(name), 1);
     }
-    add(language::suggestion(name, stanza_names()));
-    std::string_view meant = language::near_miss(front, stanza_names());
+    add(language::suggestion(name, language::stanza_names()));
+    std::string_view meant = language::near_miss(front, language::stanza_names());
     if (!meant.empty())
         return take_header(line.replaced(meant), true);
     lose_stanza();

@@ -1,12 +1,12 @@
-/* names.cpp: what the catalogue of stanzas says about names. */
+/* names.cpp: the names that the catalogue has. */
 
-#include "check/names.h"
+#include "language/names.h"
+
+#include "format/names.h"
 
 #include <span>
 
-namespace check {
-
-using language::name_list;
+namespace language {
 
 namespace {
 
@@ -33,10 +33,10 @@ name_list attribute_names(const srtable_ctrl &kind) {
     return names;
 }
 
-kind_set kinds_with(std::string_view name) {
+kind_set kinds_with(std::string_view attribute) {
     kind_set kinds;
-    for (int kind = 0; kind < SC_COUNT; ++kind)
-        kinds[index_of(kind)] = find_attr(table_of(kind), name) != nullptr;
+    for (size_t kind = 0; kind < SC_COUNT; ++kind)
+        kinds[kind] = find_attr(sc_tables[kind], attribute) != nullptr;
     return kinds;
 }
 
@@ -53,12 +53,12 @@ name_list property_names(int attr_type) {
     }
 }
 
-name_list missing_names(const srtable_ctrl &kind, vx_uint32_t mask) {
+name_list missing_names(const srtable_ctrl &kind, vx_uint32_t seen) {
     name_list names;
     for (const table_attrs &attr : kind.sc_attrs)
-        if ((attr.req_bit & OPTIONAL) == 0 && (attr.req_bit & mask) == 0)
+        if ((attr.req_bit & OPTIONAL) == 0 && (attr.req_bit & seen) == 0)
             names.emplace_back(attr.ta_name);
     return names;
 }
 
-} // namespace check
+} // namespace language

@@ -1,0 +1,30 @@
+/* names.h: the names that the catalogue has, for messages and suggestions. */
+#ifndef CDGEN_LANGUAGE_NAMES_H
+#define CDGEN_LANGUAGE_NAMES_H
+
+#include "language/catalogue.h"
+#include "language/suggestions.h"
+
+#include <bitset>
+#include <string_view>
+
+namespace language {
+
+/* Stanza kinds, by stanza_id. */
+using kind_set = std::bitset<SC_COUNT>;
+
+name_list stanza_names();
+name_list attribute_names(const srtable_ctrl &kind);
+
+/* The stanza kinds that have an attribute of exactly this name. */
+kind_set kinds_with(std::string_view attribute);
+
+/* The properties that an attribute type, such as AT_PATTR_PROPS, takes. */
+name_list property_names(int attr_type);
+
+/* The required attributes of a kind that are not in seen, a mask of their req_bits. */
+name_list missing_names(const srtable_ctrl &kind, vx_uint32_t seen);
+
+} // namespace language
+
+#endif

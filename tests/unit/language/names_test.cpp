@@ -1,0 +1,49 @@
+/* The names that the catalogue has. */
+
+#include "language/names.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+
+namespace {
+
+using language::name_list;
+
+const srtable_ctrl &map_kind() {
+    return sc_tables[SC_CLASS_TO_MANAGER_MAPPING];
+}
+
+TEST(Names, OfStanzasAreInTheOrderOfTheirKinds) {
+    name_list names = language::stanza_names();
+    ASSERT_EQ(names.size(), 19u);
+    EXPECT_EQ(names.front(), "ControlDefinition");
+    EXPECT_EQ(names.back(), "ActionOutSDDefinition");
+}
+
+TEST(Names, OfAttributesAreThoseOfTheKind) {
+    name_list names = language::attribute_names(sc_tables[SC_CONTROL_DEFINITION]);
+    EXPECT_NE(std::find(names.begin(), names.end(), "FileVersion"), names.end());
+    EXPECT_EQ(std::find(names.begin(), names.end(), "FirstKey"), names.end());
+}
+
+TEST(KindsWith, AreAllThatHaveTheAttribute) {
+    EXPECT_EQ(language::kinds_with("FirstKey"), language::kind_set().set(SC_CLASS_TO_MANAGER_MAPPING));
+    EXPECT_EQ(language::kinds_with("Range").count(), 2u);
+    EXPECT_TRUE(language::kinds_with("firstkey").none());
+    EXPECT_TRUE(language::kinds_with("").none());
+}
+
+TEST(PropertyNames, AreThoseOfTheAttributeType) {
+    EXPECT_EQ(language::property_names(AT_DATTR_PROPS), (name_list{"Public", "QryReqsMonitoring"}));
+    EXPECT_EQ(language::property_names(AT_ACTION_PROPS), (name_list{"Public", "LongRun"}));
+}
+
+TEST(MissingNames, AreRequiredAndNotSeen) {
+    name_list all = {"ResourceManager", "FirstKey", "LastKey", "MessageCatalog", "DescriptiveMessageSet"};
+    EXPECT_EQ(language::missing_names(map_kind(), 0), all);
+    EXPECT_EQ(language::missing_names(map_kind(), map_kind().sc_attrs[0].req_bit).size(), 4u);
+    EXPECT_EQ(language::missing_names(map_kind(), map_kind().req_mask_cmplt), name_list());
+}
+
+} // namespace

@@ -35,17 +35,6 @@ public:
     int line_number() const {
         return cx.linenum;
     }
-    /* Whether the line is part of a longer one, or ends the source without a newline. */
-    bool is_cut(const source_line &line) const {
-        return line.begin == cx.inbuf;
-    }
-    /* Whether the line is the first one after the reader filled its buffer. */
-    bool begins_buffer(const source_line &line) const {
-        return line.begin == cx.cdb_fp.buffer.data();
-    }
-    const char *buffer_end() const {
-        return cx.cdb_fp.buffer.data() + cx.cdb_fp.end;
-    }
 
     /* Whether a record of the kind is open. The kinds of structured data share one. */
     bool is_open(int kind) const;

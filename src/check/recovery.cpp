@@ -9,10 +9,9 @@
 
 namespace check {
 
-recovery::recovery(compilation &compiler_driven, current_line &line_taken, knowledge &known_so_far,
-                   findings &found_so_far, const view &see_all, const watchers &warnings_told)
-    : compiler(compiler_driven), line(line_taken), known(known_so_far), found(found_so_far), see(see_all),
-      warned(warnings_told) {}
+recovery::recovery(compilation &driven, current_line &current, knowledge &remembered, findings &results,
+                   const view &whole, const watchers &warnings_at_work)
+    : compiler(driven), line(current), known(remembered), found(results), see(whole), warned(warnings_at_work) {}
 
 /* ---- Errors --------------------------------------------------------------------------------------------------- */
 

@@ -15,8 +15,8 @@ namespace check {
 
 class recovery {
 public:
-    recovery(compilation &compiler_driven, current_line &line_taken, knowledge &known_so_far, findings &found_so_far,
-             const view &see_all, const watchers &warnings_told);
+    recovery(compilation &driven, current_line &current, knowledge &remembered, findings &results, const view &whole,
+             const watchers &warnings_at_work);
 
     /* Take the current line; what is wrong with it is reported. (recover_header.cpp, recover_attribute.cpp) */
     void take_header(const attr_text &text, bool guessed);

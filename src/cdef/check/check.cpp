@@ -114,7 +114,7 @@ int check_all(const check_options &options) {
 
 void add_check(CLI::App &app, int &status) {
     auto options = std::make_shared<check_options>();
-    CLI::App *command = app.add_subcommand("check", "Checks sources, and goes on behind each mistake");
+    CLI::App *command = app.add_subcommand("check", "Checks sources and reports every mistake, not just the first");
     command->add_option("SOURCE", options->sources, "Sources; - is standard input")->required();
     command->add_option("--format", options->format, "text, json or sarif")
         ->check(CLI::IsMember({"text", "json", "sarif"}));

@@ -55,7 +55,7 @@ std::string as_json(std::span<const checked_source> checked) {
             entry["findings"].push_back(json_of(found));
         all.push_back(std::move(entry));
     }
-    return cdef::json_text(all);
+    return json_text(all);
 }
 
 } // namespace report

@@ -4,7 +4,7 @@
 
 #include <nlohmann/json.hpp>
 
-namespace cdef {
+namespace report {
 
 namespace {
 
@@ -21,4 +21,4 @@ std::string json_line(const nlohmann::ordered_json &data) {
     return data.dump(-1, ' ', ASCII_ONLY);
 }
 
-} // namespace cdef
+} // namespace report

@@ -6,7 +6,7 @@
 
 #include <string>
 
-namespace cdef {
+namespace report {
 
 /* Indented, ASCII only, with a newline after it. Bytes that are not UTF-8 (a file's name may have some) become U+FFFD.
  */
@@ -15,6 +15,6 @@ std::string json_text(const nlohmann::ordered_json &data);
 /* The same on one line, without the newline. All texts are UTF-8. */
 std::string json_line(const nlohmann::ordered_json &data);
 
-} // namespace cdef
+} // namespace report
 
 #endif

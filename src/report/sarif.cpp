@@ -97,7 +97,7 @@ std::string as_sarif(std::span<const checked_source> checked) {
     log["$schema"] = "https://json.schemastore.org/sarif-2.1.0.json";
     log["version"] = "2.1.0";
     log["runs"].push_back(std::move(run));
-    return cdef::json_text(log);
+    return json_text(log);
 }
 
 } // namespace report

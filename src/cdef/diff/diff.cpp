@@ -106,7 +106,7 @@ int diff(const diff_options &options) {
             all.push_back(json_of(d));
         else
             text += line_of(d, one_class, options.compat);
-    print(options.as_json ? json_text(all) : text);
+    print(options.as_json ? report::json_text(all) : text);
     return found.empty() ? OK : FOUND;
 }
 

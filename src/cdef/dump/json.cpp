@@ -106,7 +106,7 @@ public:
     }
     void add(const label &what, const fact &f) override {
         next(what);
-        out.text += json_line(std::visit([](const auto &some) { return json_of(some); }, f));
+        out.text += report::json_line(std::visit([](const auto &some) { return json_of(some); }, f));
     }
 
     output out;
@@ -131,7 +131,7 @@ private:
         levels.back().is_empty = false;
         new_line();
         if (levels.back().end == '}')
-            out.text += json_line(what.key) + ": ";
+            out.text += report::json_line(what.key) + ": ";
     }
     void new_line() {
         out.text += '\n';

@@ -68,7 +68,7 @@ int run(const verify_options &options) {
             read = false;
         }
     }
-    print(options.as_json ? json_text(all) : text);
+    print(options.as_json ? report::json_text(all) : text);
     return !read ? TROUBLE : pass ? OK : FOUND;
 }
 

@@ -186,12 +186,10 @@ std::optional<std::vector<std::optional<std::size_t>>> deal_out(const std::vecto
 void plan_variable_classes(std::vector<class_plan> &classes, const cdb::database &db) {
     std::vector<member> members = members_of(classes);
     std::vector<group> groups = groups_of(db);
-    std::vector<var_id_t> ids;
-    std::vector<std::vector<var_id_t>> lists;
-    for (const member &m : members)
-        ids.push_back(m.id);
-    for (const group &g : groups)
-        lists.push_back(g.ids);
+    std::vector<var_id_t> ids(members.size());
+    std::vector<std::vector<var_id_t>> lists(groups.size());
+    std::transform(members.begin(), members.end(), ids.begin(), [](const member &m) { return m.id; });
+    std::transform(groups.begin(), groups.end(), lists.begin(), [](const group &g) { return g.ids; });
     auto dealt = deal_out(ids, lists);
     if (!dealt)
         no_source("variable classes", "their lists of IDs do not follow from the dynamic attributes");

@@ -308,9 +308,8 @@ std::optional<std::vector<range_lines>> find_range_lines(const std::vector<dynam
 }
 
 void plan_ranges(std::vector<class_plan> &classes) {
-    std::vector<dynamic_attributes> attributes;
-    for (const class_plan &plan : classes)
-        attributes.push_back(attributes_of(plan));
+    std::vector<dynamic_attributes> attributes(classes.size());
+    std::transform(classes.begin(), classes.end(), attributes.begin(), attributes_of);
     auto lines = find_range_lines(attributes);
     if (!lines)
         no_source("dynamic attributes", "no choice of Range lines gives all of them their bounds");

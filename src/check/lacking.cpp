@@ -20,9 +20,11 @@ language::name_list lacking_unnoticed(const view &see, int next_kind) {
         return {};
     if (kind == SC_CLASS_TO_MANAGER_MAPPING && next_kind == kind) /* a second one is an error */
         return {};
+    if (is_sd_kind(kind) && see.compiler.has_index(kind)) /* an element is asked for all else */
+        return {};
     language::name_list names = see.compiler.missing(kind);
-    if (is_sd_kind(kind)) /* of an element only the index is not asked for */
-        return !see.compiler.has_index(kind) && names.size() == 1 ? names : language::name_list();
+    if (is_sd_kind(kind) && names.size() > 1)
+        return {};
     std::erase(names, "ResourceManager"); /* an error of its own */
     return names;
 }

@@ -126,12 +126,10 @@ public:
 class low_above_high : public watcher {
 public:
     using watcher::watcher;
+    static constexpr std::array types = {AT_VARIETY, AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_RANGE};
 
     void value(const view &see) override {
-        int type = see.attr().ta_type;
-        bool variety = type == AT_VARIETY;
-        if (!variety && type != AT_VALID_VALUE && type != AT_SD_VALID_VALUE && type != AT_RANGE)
-            return;
+        bool variety = see.attr().ta_type == AT_VARIETY;
         vx_data_type_t data_type = see.compiler.data_type();
         if (!variety && !is_numeric(data_type))
             return;

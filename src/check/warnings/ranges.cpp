@@ -15,9 +15,10 @@ namespace {
 class range_elsewhere : public watcher {
 public:
     using watcher::watcher;
+    static constexpr std::array types = {AT_RANGE};
 
     void value(const view &see) override {
-        if (see.attr().ta_type != AT_RANGE || !is_numeric(see.compiler.data_type()))
+        if (!is_numeric(see.compiler.data_type()))
             return;
         if (see.known.kind == SC_DYNAMIC_CLASS_ATTRIBUTE && see.compiler.is_open(SC_DYNAMIC_RESOURCE_ATTRIBUTE))
             report(see, see.text_place(), "this Range goes to the `DynamicResourceAttribute` that is still open",

@@ -139,6 +139,9 @@ watchers::watchers(const warning_set &wanted, findings &found) {
         for (size_t event = 0; event < EVENTS; ++event)
             if (made.events[event])
                 of_event[event].push_back(made.warning.get());
+        for (size_t type = 0; type < AT_COUNT; ++type)
+            if (made.types[type])
+                of_value[type].push_back(made.warning.get());
         all.push_back(std::move(made.warning));
     }
 }

@@ -27,6 +27,7 @@ public:
 private:
     std::vector<std::unique_ptr<watcher>> all;
     std::array<std::vector<watcher *>, EVENTS> of_event;
+    std::array<std::vector<watcher *>, AT_COUNT> of_value; /* the warnings that look at an attribute type's values */
 };
 
 } // namespace check

@@ -20,7 +20,7 @@ bool is_action_run(int kind) {
 class sd_attribute {
 public:
     void take_value(const view &see) {
-        if (see.attr().ta_type != AT_DATA_TYPE || scalar_vx(see.compiler.data_type()) != VX_SD_PTR)
+        if (scalar_vx(see.compiler.data_type()) != VX_SD_PTR)
             return;
         header = {see.known.stanza().header, {}, see.known.stanza().source};
         open = true;
@@ -44,6 +44,7 @@ private:
 class sd_without_run : public watcher {
 public:
     using watcher::watcher;
+    static constexpr std::array types = {AT_DATA_TYPE};
 
     void value(const view &see) override {
         latest.take_value(see);
@@ -61,6 +62,7 @@ private:
 class sd_run_at_end : public watcher {
 public:
     using watcher::watcher;
+    static constexpr std::array types = {AT_DATA_TYPE};
 
     void value(const view &see) override {
         latest.take_value(see);

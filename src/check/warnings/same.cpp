@@ -13,6 +13,7 @@ std::string another(const view &see, const char *what) {
 class same_name : public watcher {
 public:
     using watcher::watcher;
+    static constexpr std::array types = {AT_STRING, AT_SD_NAME};
 
     void value(const view &see) override {
         if (int first = see.known.declared.earlier_name; first != 0)
@@ -23,6 +24,7 @@ public:
 class same_id : public watcher {
 public:
     using watcher::watcher;
+    static constexpr std::array types = {AT_ID};
 
     void value(const view &see) override {
         if (int first = see.known.declared.earlier_id; first != 0)

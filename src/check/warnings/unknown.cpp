@@ -18,10 +18,10 @@ namespace {
 class unknown_locator : public watcher {
 public:
     using watcher::watcher;
+    static constexpr std::array types = {AT_LOCATOR};
 
     void value(const view &see) override {
-        if (see.attr().ta_type == AT_LOCATOR)
-            locator = see.value_mention();
+        locator = see.value_mention();
     }
 
     void source_end(const view &see) override {
@@ -39,6 +39,7 @@ private:
 class unknown_variable_class : public watcher {
 public:
     using watcher::watcher;
+    static constexpr std::array types = {AT_STRING};
 
     void value(const view &see) override {
         if (std::string_view(see.attr().ta_name) != "VariableClass")

@@ -12,9 +12,10 @@ namespace {
 class unused_default : public watcher {
 public:
     using watcher::watcher;
+    static constexpr std::array types = {AT_DEFAULT_VALUE};
 
     void value(const view &see) override {
-        if (see.attr().ta_type == AT_DEFAULT_VALUE && see.known.kind == SC_PERSISTENT_CLASS_ATTRIBUTE)
+        if (see.known.kind == SC_PERSISTENT_CLASS_ATTRIBUTE)
             report(see, see.name_place(),
                    "the default of a class attribute is that of its type: this one is never used");
     }
@@ -23,10 +24,9 @@ public:
 class permission : public watcher {
 public:
     using watcher::watcher;
+    static constexpr std::array types = {AT_PERMISSION};
 
     void value(const view &see) override {
-        if (see.attr().ta_type != AT_PERMISSION)
-            return;
         std::string_view text = see.value();
         place at = see.value_place();
         bool known = std::any_of(std::begin(perm_list), std::end(perm_list),
@@ -43,10 +43,10 @@ public:
 class element_type : public watcher {
 public:
     using watcher::watcher;
+    static constexpr std::array types = {AT_SD_DATA_TYPE};
 
     void value(const view &see) override {
-        bool element = see.attr().ta_type == AT_SD_DATA_TYPE;
-        if (!element || see.compiler.data_type() != VX_UNKNOWN || see.compiler.run_makes_value())
+        if (see.compiler.data_type() != VX_UNKNOWN || see.compiler.run_makes_value())
             return;
         place at = see.value_place();
         report(see, at, "unknown data type: the element gets none", {at, language::type_suggestion(see.value(), true)});

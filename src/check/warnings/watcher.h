@@ -8,6 +8,8 @@
 #include "check/view.h"
 #include "language/suggestions.h"
 
+#include <array>
+#include <bitset>
 #include <memory>
 #include <string>
 #include <type_traits>
@@ -36,7 +38,7 @@ public:
     /* The same, if the attribute surely belongs to the current stanza: first for each number in the value
      * that is not plain, */
     virtual void number(const view &, const number_part &) {}
-    /* then for the whole. */
+    /* then for the whole. Only for the attribute types that the class lists as `types`. */
     virtual void value(const view &) {}
     /* The current stanza, if there is one, ends; the next one's kind is NO_KIND at the end of the source or if it is
      * not known. */
@@ -99,13 +101,23 @@ template <class Warning> constexpr event_set events_of() {
     };
 }
 
+/* The attribute types whose values a warning looks at. */
+template <class Warning> std::bitset<AT_COUNT> types_of() {
+    std::bitset<AT_COUNT> all;
+    if constexpr (events_of<Warning>()[ON_VALUE])
+        for (attr_type type : Warning::types)
+            all.set(type);
+    return all;
+}
+
 struct made_watcher {
     std::unique_ptr<watcher> warning;
     event_set events;
+    std::bitset<AT_COUNT> types;
 };
 
 template <class Warning> made_watcher make(const watcher_setup &setup) {
-    return {std::make_unique<Warning>(setup), events_of<Warning>()};
+    return {std::make_unique<Warning>(setup), events_of<Warning>(), types_of<Warning>()};
 }
 
 /* Each warning's file ends with one. */

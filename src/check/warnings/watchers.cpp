@@ -18,7 +18,7 @@ void watchers::attribute(const view &see) const {
         if (!part.is_plain())
             for (watcher *each : of_event[ON_NUMBER])
                 each->number(see, part);
-    for (watcher *each : of_event[ON_VALUE])
+    for (watcher *each : of_value[index_of(see.attr().ta_type)])
         each->value(see);
 }
 

@@ -1,14 +1,22 @@
-# Run by cpack over the staged tree, before the package is made: what Debian's policy asks for beyond cmake --install.
+# Run by cpack over the staged trees, before the packages are made: what Debian's policy asks for beyond cmake --install.
 
 if(NOT CPACK_GENERATOR STREQUAL "DEB")
   return()
 endif()
-set(share "${CPACK_TEMPORARY_INSTALL_DIRECTORY}${CPACK_PACKAGING_INSTALL_PREFIX}/share")
-set(doc "${share}/doc/${CPACK_PACKAGE_NAME}")
+string(TIMESTAMP released "%a, %d %b %Y %H:%M:%S +0000" UTC) # SOURCE_DATE_EPOCH, which package_time.cmake has set
 
-# The licence is one of those that every system has.
-file(REMOVE "${doc}/LICENSE")
-file(WRITE "${doc}/copyright" "Format: https://www.debian.org/doc/packaging-manuals/copyright-format/1.0/
+# Pages and changes are compressed, without a time, so that equal builds make equal packages.
+function(compress)
+  foreach(file IN LISTS ARGN)
+    execute_process(COMMAND gzip -9n "${file}" COMMAND_ERROR_IS_FATAL ANY)
+  endforeach()
+endfunction()
+
+# Every package says whose it is and what has changed.
+function(complete component package)
+  set(share "${CPACK_TEMPORARY_DIRECTORY}/${component}${CPACK_PACKAGING_INSTALL_PREFIX}/share")
+  set(doc "${share}/doc/${package}")
+  file(WRITE "${doc}/copyright" "Format: https://www.debian.org/doc/packaging-manuals/copyright-format/1.0/
 Upstream-Name: ${CPACK_PACKAGE_NAME}
 
 Files: *
@@ -17,20 +25,20 @@ License: Apache-2.0
  On Debian systems the text of the licence is in
  /usr/share/common-licenses/Apache-2.0.
 ")
+  file(WRITE "${doc}/changelog.Debian"
+    "${CPACK_PACKAGE_NAME} (${CPACK_PACKAGE_VERSION}-${CPACK_DEBIAN_PACKAGE_RELEASE}) unstable; urgency=medium
 
-string(TIMESTAMP released "%a, %d %b %Y %H:%M:%S +0000" UTC) # SOURCE_DATE_EPOCH, which package_time.cmake has set
-file(WRITE "${doc}/changelog.Debian"
-  "${CPACK_PACKAGE_NAME} (${CPACK_PACKAGE_VERSION}-${CPACK_DEBIAN_PACKAGE_RELEASE}) unstable; urgency=medium
-
-  * What is new stands in changelog.gz.
+  * See changelog.gz for the changes.
 
  -- ${CPACK_PACKAGE_CONTACT}  ${released}
 ")
+  file(COPY_FILE "${CMAKE_CURRENT_LIST_DIR}/../CHANGELOG.md" "${doc}/changelog")
+  file(GLOB pages "${share}/man/man*/*")
+  compress(${pages} "${doc}/changelog" "${doc}/changelog.Debian")
+endfunction()
 
-# Pages and changes are compressed, without a time, so that equal builds make equal packages. The changes also stay as
-# they are: other documents have links to them.
-file(COPY_FILE "${doc}/CHANGELOG.md" "${doc}/changelog")
-file(GLOB pages "${share}/man/man*/*")
-foreach(file IN LISTS pages ITEMS "${doc}/changelog" "${doc}/changelog.Debian")
-  execute_process(COMMAND gzip -9n "${file}" COMMAND_ERROR_IS_FATAL ANY)
-endforeach()
+complete(program cdgen)
+complete(development cdgen-dev)
+complete(documents cdgen-doc)
+# The licence is one of those that every system has.
+file(REMOVE "${CPACK_TEMPORARY_DIRECTORY}/documents${CPACK_PACKAGING_INSTALL_PREFIX}/share/doc/cdgen/LICENSE")

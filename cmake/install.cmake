@@ -12,16 +12,17 @@ if(TARGET cdef)
   list(APPEND programs cdef)
 endif()
 
-install(TARGETS ${programs} cdb_view EXPORT cdgenTargets)
+install(TARGETS ${programs} EXPORT cdgenTargets COMPONENT program)
+install(TARGETS cdb_view EXPORT cdgenTargets COMPONENT development)
 target_include_directories(cdb_view INTERFACE "$<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}/cdgen>")
-install(FILES ${headers} DESTINATION "${CMAKE_INSTALL_INCLUDEDIR}/cdgen")
+install(FILES ${headers} DESTINATION "${CMAKE_INSTALL_INCLUDEDIR}/cdgen" COMPONENT development)
 
 # For find_package.
 configure_package_config_file(cmake/cdgenConfig.cmake.in cdgenConfig.cmake INSTALL_DESTINATION "${package_dir}")
 write_basic_package_version_file(cdgenConfigVersion.cmake COMPATIBILITY SameMinorVersion)
-install(EXPORT cdgenTargets NAMESPACE cdgen:: DESTINATION "${package_dir}")
+install(EXPORT cdgenTargets NAMESPACE cdgen:: DESTINATION "${package_dir}" COMPONENT development)
 install(FILES "${CMAKE_CURRENT_BINARY_DIR}/cdgenConfig.cmake" "${CMAKE_CURRENT_BINARY_DIR}/cdgenConfigVersion.cmake"
-  cmake/cdgenCompile.cmake cmake/cdgenRun.cmake DESTINATION "${package_dir}")
+  cmake/cdgenCompile.cmake cmake/cdgenRun.cmake DESTINATION "${package_dir}" COMPONENT development)
 
 # For pkg-config. Paths count from the file itself, unless a directory was asked for that is outside the prefix.
 function(pc_path variable directory)
@@ -46,31 +47,35 @@ if(TARGET cdef)
   set(pc_cdef "cdef=\${bindir}/cdef\n")
 endif()
 configure_file(cmake/cdgen.pc.in cdgen.pc @ONLY)
-install(FILES "${CMAKE_CURRENT_BINARY_DIR}/cdgen.pc" DESTINATION "${CMAKE_INSTALL_LIBDIR}/pkgconfig")
+install(FILES "${CMAKE_CURRENT_BINARY_DIR}/cdgen.pc" DESTINATION "${CMAKE_INSTALL_LIBDIR}/pkgconfig" COMPONENT development)
 
 # For people.
 foreach(program IN LISTS programs)
-  install(FILES man/${program}.1 DESTINATION "${CMAKE_INSTALL_MANDIR}/man1")
+  install(FILES man/${program}.1 DESTINATION "${CMAKE_INSTALL_MANDIR}/man1" COMPONENT program)
 endforeach()
-install(FILES man/cdefsrc.5 man/cdef.5 DESTINATION "${CMAKE_INSTALL_MANDIR}/man5")
-install(FILES README.md CHANGELOG.md CONTRIBUTING.md LICENSE SECURITY.md DESTINATION "${CMAKE_INSTALL_DOCDIR}")
-install(DIRECTORY docs examples DESTINATION "${CMAKE_INSTALL_DOCDIR}"
+install(FILES man/cdefsrc.5 man/cdef.5 DESTINATION "${CMAKE_INSTALL_MANDIR}/man5" COMPONENT program)
+install(FILES README.md CHANGELOG.md CONTRIBUTING.md LICENSE SECURITY.md DESTINATION "${CMAKE_INSTALL_DOCDIR}"
+  COMPONENT documents)
+install(DIRECTORY docs examples DESTINATION "${CMAKE_INSTALL_DOCDIR}" COMPONENT documents
   PATTERN Doxyfile EXCLUDE PATTERN mkdocs.yml EXCLUDE)
 
 # Links of the documents to ../include lead to the headers.
 file(RELATIVE_PATH headers_of_docs "${CMAKE_INSTALL_FULL_DOCDIR}" "${CMAKE_INSTALL_FULL_INCLUDEDIR}/cdgen")
 file(MAKE_DIRECTORY "${CMAKE_CURRENT_BINARY_DIR}/doc")
 file(CREATE_LINK "${headers_of_docs}" "${CMAKE_CURRENT_BINARY_DIR}/doc/include" SYMBOLIC)
-install(FILES "${CMAKE_CURRENT_BINARY_DIR}/doc/include" DESTINATION "${CMAKE_INSTALL_DOCDIR}")
+install(FILES "${CMAKE_CURRENT_BINARY_DIR}/doc/include" DESTINATION "${CMAKE_INSTALL_DOCDIR}" COMPONENT documents)
 
-# For editors, which have no common place.
-install(DIRECTORY editors/vim editors/vscode DESTINATION "${CMAKE_INSTALL_DATADIR}/cdgen/editors")
+# For editors. Vim looks below its own prefix for the files of all users; Visual Studio Code has no such place.
+set(CDGEN_VIM_DIR "${CMAKE_INSTALL_DATADIR}/vim/vimfiles" CACHE STRING "Where Vim looks for the files of all users")
+install(DIRECTORY editors/vim/ DESTINATION "${CDGEN_VIM_DIR}" COMPONENT program)
+install(DIRECTORY editors/vscode DESTINATION "${CMAKE_INSTALL_DATADIR}/cdgen/editors" COMPONENT program)
 
 # For shells.
 set(CDGEN_ZSH_DIR "${CMAKE_INSTALL_DATADIR}/zsh/site-functions" CACHE STRING "Where zsh looks for completions")
 foreach(program IN LISTS programs)
   install(FILES completions/${program}.bash DESTINATION "${CMAKE_INSTALL_DATADIR}/bash-completion/completions"
-    RENAME ${program})
-  install(FILES completions/_${program} DESTINATION "${CDGEN_ZSH_DIR}")
-  install(FILES completions/${program}.fish DESTINATION "${CMAKE_INSTALL_DATADIR}/fish/vendor_completions.d")
+    RENAME ${program} COMPONENT program)
+  install(FILES completions/_${program} DESTINATION "${CDGEN_ZSH_DIR}" COMPONENT program)
+  install(FILES completions/${program}.fish DESTINATION "${CMAKE_INSTALL_DATADIR}/fish/vendor_completions.d"
+    COMPONENT program)
 endforeach()

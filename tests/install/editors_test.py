@@ -82,7 +82,7 @@ class Vim(Case):
         (self.here / "ask.vim").write_text(script)
         out = self.here / "said"
         run("vim", "-u", "NONE", "-N", "-i", "NONE", "-es",
-            "--cmd", f"let &runtimepath = '{tree()}/share/cdgen/editors/vim,' . &runtimepath",
+            "--cmd", f"let &runtimepath = '{tree()}/share/vim/vimfiles,' . &runtimepath",
             "-c", "filetype plugin on", "-c", "syntax on", "-c", f"edit {file}",
             "-c", "let said = []", "-S", self.here / "ask.vim",
             "-c", f"call writefile(said, '{out}')", "-c", "qall!", cwd=self.here)

@@ -76,7 +76,7 @@ class WithoutTheInspector(Case):
         run("cmake", "--install", build, "--prefix", prefix)
         ours = {path.relative_to(tree()) for path in tree().rglob("*") if path.stem.lstrip("_") == "cdef"}
         self.assertEqual({path.parts[0] for path in ours}, {"bin", "share"})
-        ours.remove(pathlib.Path("share/cdgen/editors/vim/compiler/cdef.vim"))  # which only runs it
+        ours.remove(pathlib.Path("share/vim/vimfiles/compiler/cdef.vim"))  # which only runs it
         ours.remove(pathlib.Path("share/man/man5/cdef.5"))  # the file's format, not the program
         here = {path.relative_to(prefix) for path in prefix.rglob("*")}
         self.assertEqual(ours & here, set())

@@ -9,6 +9,10 @@
 #ifndef CDGEN_CDB_FIELDS_H
 #define CDGEN_CDB_FIELDS_H
 
+#if __cplusplus < 202002L
+#error "cdb_fields.h needs C++20"
+#else
+
 #include "cdb.h"
 
 #include <cstddef>
@@ -460,4 +464,5 @@ inline constexpr std::span<const field> fields_of<vx_structured_data_element_t> 
 
 } // namespace cdb
 
+#endif
 #endif

@@ -13,6 +13,10 @@
 #ifndef CDGEN_CDB_VIEW_H
 #define CDGEN_CDB_VIEW_H
 
+#if __cplusplus < 202002L
+#error "cdb_view.h needs C++20"
+#else
+
 #include "cdb_fields.h"
 
 #include <algorithm>
@@ -1164,4 +1168,5 @@ std::vector<region> regions(const database &db);
 
 } // namespace cdb
 
+#endif
 #endif

@@ -115,18 +115,21 @@ int check_all(const check_options &options) {
 void add_check(CLI::App &app, int &status) {
     auto options = std::make_shared<check_options>();
     CLI::App *command = app.add_subcommand("check", "Checks sources and reports every mistake, not just the first");
-    command->add_option("SOURCE", options->sources, "Sources; - is standard input")->required();
-    command->add_option("--format", options->format, "text, json or sarif")
+    command->add_option("SOURCE", options->sources, "Source to check; - is standard input")->required();
+    command->add_option("--format", options->format, "Form of the findings: text (on standard error), json or sarif")
         ->check(CLI::IsMember({"text", "json", "sarif"}));
-    command->add_option("--warn", options->wanted, "Warns of NAME, or of all")
+    command->add_option("--warn", options->wanted, "Turn on warning NAME, or all")
         ->type_name("NAME")
         ->allow_extra_args(false)
         ->check(CLI::IsMember(warning_names()));
-    command->add_option("--no-warn", options->unwanted, "Does not warn of NAME, or of all")
+    command->add_option("--no-warn", options->unwanted, "Turn off warning NAME, or all")
         ->type_name("NAME")
         ->allow_extra_args(false)
         ->check(CLI::IsMember(warning_names()));
-    command->add_flag("--werror", options->warnings_count, "Warnings count as errors");
+    command->add_flag("--werror", options->warnings_count, "Count warnings as errors");
+    command->footer(
+        "Exit status: 0 without errors, 1 with errors (with --werror: or warnings), 2 if a source cannot be "
+        "read.");
     command->callback([options, &status] { status = check_all(*options); });
 }
 

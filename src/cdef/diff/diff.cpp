@@ -114,14 +114,14 @@ int diff(const diff_options &options) {
 
 void add_diff(CLI::App &app, int &status) {
     auto options = std::make_shared<diff_options>();
-    CLI::App *command =
-        app.add_subcommand("diff", "Shows what differs between two databases; blind to how they are laid out");
-    command->add_option("A", options->before, "The one database; - is standard input")->required();
-    command->add_option("B", options->after, "The other")->required();
-    command->add_flag("--compat", options->compat, "Show only what keeps readers of A from reading B, and why");
-    command->add_flag("--json", options->as_json, "Differences as JSON");
-    command->footer("Exit status: 0 if they are the same (with --compat: if readers of A can read B), 1 if not, 2 if "
-                    "that cannot be told.");
+    CLI::App *command = app.add_subcommand("diff", "Shows how two databases differ in meaning, not in layout");
+    command->add_option("A", options->before, "First database; - is standard input")->required();
+    command->add_option("B", options->after, "Second database; - is standard input")->required();
+    command->add_flag("--compat", options->compat,
+                      "Show only what keeps programs written for A from reading B, and why");
+    command->add_flag("--json", options->as_json, "Write differences as JSON");
+    command->footer("Exit status: 0 if they are the same (with --compat: if programs written for A can read B), 1 if "
+                    "not, 2 if a database cannot be read.");
     command->callback([options, &status] { status = diff(*options); });
 }
 

@@ -35,12 +35,13 @@ void run(const dump_options &options) {
 void add_dump(CLI::App &app, int &status) {
     auto options = std::make_shared<dump_options>();
     CLI::App *command = app.add_subcommand("dump", "Shows what is in a database");
-    command->add_option("FILE", options->file, "Database; - is standard input")->required();
-    auto *json = command->add_flag("--json", options->as_json, "As JSON");
-    auto *hex = command->add_flag("--hex", options->as_hex, "Every byte and what it is, of a damaged file too");
-    command->add_flag("--offsets", options->with_offsets, "Also where in the file things stand")->excludes(hex);
+    command->add_option("FILE", options->file, "Database to show; - is standard input")->required();
+    auto *json = command->add_flag("--json", options->as_json, "Write JSON");
+    auto *hex = command->add_flag("--hex", options->as_hex, "Show every byte and what it is, even of a damaged file");
+    command->add_flag("--offsets", options->with_offsets, "Also show the offset of each record and list")
+        ->excludes(hex);
     json->excludes(hex);
-    command->footer("Exit status: 0 if the database is shown, 2 if it cannot be.");
+    command->footer("Exit status: 0 if the database is shown, 2 if it cannot be shown.");
     command->callback([options, &status] {
         run(*options);
         status = OK;

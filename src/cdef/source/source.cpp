@@ -48,9 +48,10 @@ int run(const std::string &path) {
 
 void add_source(CLI::App &app, int &status) {
     auto path = std::make_shared<std::string>();
-    CLI::App *command = app.add_subcommand("source", "Writes a source that compiles to a database that means the same");
-    command->add_option("FILE", *path, "The database; - is standard input")->required();
-    command->footer("Exit status: 0 if the source is written, 2 if there is none.");
+    CLI::App *command =
+        app.add_subcommand("source", "Writes a source that compiles to a database with the same meaning");
+    command->add_option("FILE", *path, "Database to turn into a source; - is standard input")->required();
+    command->footer("Exit status: 0 if the source is written, 2 if the database has none.");
     command->callback([path, &status] { status = run(*path); });
 }
 

@@ -77,13 +77,13 @@ int run(const verify_options &options) {
 void add_verify(CLI::App &app, int &status) {
     auto options = std::make_shared<verify_options>();
     CLI::App *command =
-        app.add_subcommand("verify", "Checks whether databases are sound; says nothing of those without findings");
-    command->add_option("FILE", options->files, "Databases; - is standard input")->required();
-    command->add_flag("--json", options->as_json, "Findings as JSON");
-    command->add_flag("--werror", options->warnings_count, "Warnings count as errors");
+        app.add_subcommand("verify", "Checks whether databases are sound; prints nothing about flawless ones");
+    command->add_option("FILE", options->files, "Database to verify; - is standard input")->required();
+    command->add_flag("--json", options->as_json, "Write findings as JSON");
+    command->add_flag("--werror", options->warnings_count, "Count warnings as errors");
     command->add_flag("-q,--quiet", options->quiet, "Show errors only");
-    command->footer("Exit status: 0 if there are no errors (with --werror: no warnings either), 1 if there are, 2 if a "
-                    "file cannot be read.");
+    command->footer("Exit status: 0 without errors, 1 with errors (with --werror: or warnings), 2 if a file cannot be "
+                    "read.");
     command->callback([options, &status] { status = run(*options); });
 }
 

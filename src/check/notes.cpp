@@ -3,6 +3,8 @@
 #include "check/notes.h"
 
 #include "check/numbers.h"
+#include "format/data_types.h"
+#include "format/names.h"
 #include "language/names.h"
 
 #include <algorithm>

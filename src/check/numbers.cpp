@@ -3,6 +3,7 @@
 #include "check/numbers.h"
 
 #include "compiler/cdgen.h"
+#include "format/data_types.h"
 
 #include <algorithm>
 #include <cerrno>

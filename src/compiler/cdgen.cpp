@@ -1,7 +1,9 @@
 /* cdgen.cpp: the driver: command line, the fixed order of the phases, and the one place that prints a fatal message. */
 
 #include "compiler/cdgen.h"
+
 #include "compiler/cdgen_closing.h"
+#include "compiler/cdgen_process.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -16,13 +18,13 @@ void parse_options(cdgen &cx, int argc, char **argv) {
     for (int option = 0; (option = getopt(argc, argv, "nd:s")) != -1;) {
         switch (option) {
         case 'n':
-            cx.interactive = 0;
+            cx.options.interactive = 0;
             break;
         case 'd':
-            cx.debugLevel = atoi(optarg); /* text that is no number is 0; not a conversion of the source's */
+            cx.options.debugLevel = atoi(optarg); /* text that is no number is 0; not a conversion of the source's */
             break;
         case 's':
-            cx.swap_endianness = 1;
+            cx.options.swap_endianness = 1;
             break;
         default: /* getopt has complained: nothing else is to be printed */
             throw fatal_exit{NO_MESSAGE, nullptr, nullptr, 0, 1};
@@ -36,10 +38,10 @@ void parse_command_line(cdgen &cx, int argc, char **argv) {
     if (optind >= argc)
         cdgen_error_exit(MSG_USAGE, argv[0],
                          " [-s] cdefsrc_filename cdef_filename\n    -s Reverse endianness of CDB.\n", 0, 1);
-    cx.cdefsrc = argv[optind++];
+    cx.options.cdefsrc = argv[optind++];
     if (optind >= argc)
         cdgen_error_exit(MSG_USAGE_NO_OUTPUT, argv[0], " cdefsrc_filename cdef_filename", 0, 1);
-    cx.cdefname = argv[optind];
+    cx.options.cdefname = argv[optind];
 }
 
 /* Traces come first: some explain the message. */
@@ -47,7 +49,7 @@ int report(const cdgen &cx, const fatal_exit &failure) {
     fflush(stdout);
     if (failure.id == NO_MESSAGE)
         return failure.code;
-    const char *end = cx.interactive ? "\n" : "";
+    const char *end = cx.options.interactive ? "\n" : "";
     auto [first, second, third] = words_of(failure);
     if (failure.line != 0)
         fprintf(stderr, "%d: %s%s%s%s", failure.line, first, second, third, end);
@@ -61,12 +63,10 @@ int report(const cdgen &cx, const fatal_exit &failure) {
 cdgen::~cdgen() {
     discard_mapfile(*this);
     set_unfinished_output(nullptr);
-    for (tbl_content &content : filed)
-        free(content.tbl_base);
 }
 
 void compile(cdgen &cx) {
-    cache_input_data(cx, cx.cdefsrc);
+    cache_input_data(cx, cx.options.cdefsrc);
     for (closing_step step : closing_steps)
         step(cx);
     bld_cdb(cx);

@@ -1,7 +1,9 @@
 /* cdgen_attr.cpp: one attribute line: its syntax, the order and repetition rules. */
 
 #include "compiler/cdgen_attr.h"
+
 #include "compiler/cdgen_stanzas.h"
+#include "compiler/cdgen_values.h"
 
 #include <cstdio>
 
@@ -17,7 +19,7 @@ struct name_value {
 name_value split_line(cdgen &cx, const attr_text &text) {
     char *name = text.name;
     char *end = text.end;
-    cx.linepos = 1 + static_cast<int>(name - text.line);
+    cx.source.linepos = 1 + static_cast<int>(name - text.line);
     if (name == end)
         return {};
     auto *equals = static_cast<char *>(memchr(name, '=', static_cast<size_t>(end - name)));
@@ -33,7 +35,7 @@ name_value split_line(cdgen &cx, const attr_text &text) {
     auto length = static_cast<size_t>(end - unquoted);
     if (length > VALUE_MAX_CHARS)
         source_error(cx, MSG_VALUE_TOO_LONG, name);
-    cx.linepos = 1 + static_cast<int>(unquoted - text.line);
+    cx.source.linepos = 1 + static_cast<int>(unquoted - text.line);
     return {{name, static_cast<size_t>(equals - name)}, unquoted, length};
 }
 
@@ -45,7 +47,8 @@ const table_attrs &known_attr(cdgen &cx, const srtable_ctrl &scp, std::string_vi
 }
 
 bool missing_excused(const cdgen &cx, const srtable_ctrl &scp) {
-    return cx.observer != nullptr && cx.observer->excuses_missing(static_cast<int>(&scp - sc_tables.data()));
+    return cx.options.observer != nullptr &&
+           cx.options.observer->excuses_missing(static_cast<int>(&scp - sc_tables.data()));
 }
 
 /* Optional attributes follow the required ones; most may stand once. */
@@ -61,32 +64,27 @@ void count_required(cdgen &cx, stanza_state &state, const table_attrs &attr) {
     if ((state.req_mask & attr.req_bit) != 0 && !attr.dup_allowed)
         source_error(cx, MSG_REPEATED_ATTRIBUTE, attr.ta_name);
     state.req_mask |= attr.req_bit;
-    if (cx.debugLevel >= 2)
+    if (cx.options.debugLevel >= 2)
         printf("Added %x to mask, which is now %x\n", attr.req_bit, state.req_mask);
 }
 
 } // namespace
 
-void save_attr(cdgen &cx, char *il, int table_id) {
-    char *name = il + strspn(il, " \t");
-    save_attr_line(cx, {il, name, name + strlen(name)}, static_cast<stanza_id>(table_id));
-}
-
 void save_attr_line(cdgen &cx, const attr_text &text, stanza_id kind) {
     const srtable_ctrl &scp = sc_tables[kind];
-    stanza_state &state = cx.stanzas[kind];
+    stanza_state &state = cx.framing.stanzas[kind];
     auto [name, value, length] = split_line(cx, text);
     if (value == nullptr)
         return;
     const table_attrs &attr = known_attr(cx, scp, name);
-    if (cx.observer != nullptr)
-        cx.observer->attribute_read({&attr, value, length});
+    if (cx.options.observer != nullptr)
+        cx.options.observer->attribute_read({&attr, value, length});
     if (*value == '\0') {
-        if (cx.explanations != nullptr)
-            fprintf(cx.explanations, "In file %s: ", cx.cdefsrc);
+        if (cx.options.explanations != nullptr)
+            fprintf(cx.options.explanations, "In file %s: ", cx.options.cdefsrc);
         source_error(cx, MSG_NO_VALUE, attr.ta_name);
     }
-    if (cx.debugLevel >= 2)
+    if (cx.options.debugLevel >= 2)
         printf("%s: found attr: \"%s\", value: \"%s\",length: %d\n", scp.sc_name, attr.ta_name, value,
                static_cast<int>(length));
     if ((attr.req_bit & OPTIONAL) != 0)

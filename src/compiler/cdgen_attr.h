@@ -2,7 +2,7 @@
 #ifndef CDGEN_CDGEN_ATTR_H
 #define CDGEN_CDGEN_ATTR_H
 
-#include "compiler/cdgen.h"
+#include "compiler/cdgen_context.h"
 
 /* A checked attribute line. */
 struct attr_line {

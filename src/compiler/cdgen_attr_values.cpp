@@ -1,7 +1,10 @@
 /* cdgen_attr_values.cpp: the value handler of each attribute type. */
 
 #include "compiler/cdgen_attr.h"
+
+#include "compiler/cdgen_kinds.h"
 #include "compiler/cdgen_stanzas.h"
+#include "compiler/cdgen_values.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -104,16 +107,16 @@ void store_variable_type(const attr_line &line) {
 void store_manager(const attr_line &line) {
     cdgen &cx = line.cx;
     store(field_of(line), vx_uint16_t{0});
-    if (cx.rm_name != nullptr)
-        cdgen_error_exit(MSG_SECOND_MANAGER, cx.rm_name.get(), nullptr, 0, 1);
-    cx.rm_name.reset(strdup(line.value));
-    if (cx.rm_name == nullptr)
+    if (cx.later.rm_name != nullptr)
+        cdgen_error_exit(MSG_SECOND_MANAGER, cx.later.rm_name.get(), nullptr, 0, 1);
+    cx.later.rm_name.reset(strdup(line.value));
+    if (cx.later.rm_name == nullptr)
         cdgen_error_exit(MSG_NO_MEMORY_FOR_NAME, strerror(errno), nullptr, 0, errno);
 }
 
 void store_locator(const attr_line &line) {
-    line.cx._rc_locator.ptr = &line.cx.cb_rsrc_class.rc_locator;
-    memcpy(line.cx._rc_locator.name, line.value, line.length + 1);
+    line.cx.later._rc_locator.ptr = &line.cx.staged.cb_rsrc_class.rc_locator;
+    memcpy(line.cx.later._rc_locator.name, line.value, line.length + 1);
 }
 
 void ignore(const attr_line &) {}
@@ -192,7 +195,7 @@ void add_valid_value(const attr_line &line) {
     vv_entry_t entry = {};
     store_bounds(line, scalar_vx(data_type(line)), &entry);
     *record_at<vv_entry_t>(lists, at) = entry;
-    cx.vvdisp = at + offsetof(vv_entry_t, vv_disp_msgid);
+    cx.valid_values.vvdisp = at + offsetof(vv_entry_t, vv_disp_msgid);
     ++record_at<valid_values_t>(lists, list)->vv_count;
 }
 
@@ -207,9 +210,10 @@ void store_valid_value(const attr_line &line) {
 
 void store_value_display(const attr_line &line) {
     cdgen &cx = line.cx;
-    if (!cx.vvdisp.has_value())
+    if (!cx.valid_values.vvdisp.has_value())
         source_error(cx, MSG_NO_VALID_VALUE);
-    *record_at<vx_uint16_t>(sc_vv_tbl(cx, line.scp), *cx.vvdisp) = static_cast<vx_uint16_t>(integer(line, line.value));
+    *record_at<vx_uint16_t>(sc_vv_tbl(cx, line.scp), *cx.valid_values.vvdisp) =
+        static_cast<vx_uint16_t>(integer(line, line.value));
 }
 
 /* ---- Data types, defaults and ranges --------------------------------------------------------------------------- */
@@ -219,10 +223,10 @@ bool is_sd(vx_data_type_t type) {
 }
 
 std::shared_ptr<dflt_values> new_dflt_values(cdgen &cx, const char *name) {
-    if (cx.spare_dflt == nullptr)
+    if (cx.framing.spare_dflt == nullptr)
         return std::make_shared<dflt_values>(name);
-    cx.spare_dflt->restart(name);
-    return std::move(cx.spare_dflt);
+    cx.framing.spare_dflt->restart(name);
+    return std::move(cx.framing.spare_dflt);
 }
 
 /* Collects the value; the attribute's completion makes one of all that were given. */
@@ -246,10 +250,9 @@ void store_default(const attr_line &line) {
 void expect_sd_run(const attr_line &line, vx_data_type_t type) {
     cdgen &cx = line.cx;
     const attr_kind &kind = *line.scp.sc_attr;
-    cx.attr_dflt_val = reinterpret_cast<vx_value_t *>(line.record + kind.value_offset);
-    cx.curr_sd_tbl = reinterpret_cast<cdb_ref_t *>(line.record + kind.sd_offset);
-    cx.max_sd_idx = reinterpret_cast<vx_uint16_t *>(line.record + kind.max_sd_idx_offset);
-    cx.sd_attr_type = kind.sd_attr_type;
+    cx.sd.announce(reinterpret_cast<vx_value_t *>(line.record + kind.value_offset),
+                   reinterpret_cast<cdb_ref_t *>(line.record + kind.sd_offset),
+                   reinterpret_cast<vx_uint16_t *>(line.record + kind.max_sd_idx_offset), kind.sd_attr_type);
     line.state.dflt.tbl = new_dflt_values(cx, type == VX_SD_PTR ? "VX_SD_PTR" : "VX_SD_PTR_ARRAY");
 }
 
@@ -275,14 +278,14 @@ void store_range(const attr_line &line) {
     vx_data_type_t type = data_type(line);
     if (!takes_range(type))
         return;
-    cx.dattr_range_found = 1;
+    cx.range.dattr_range_found = 1;
     char *max = after_comma(line);
     if (max == nullptr)
         source_error(cx, MSG_RANGE_NEEDS_TWO);
-    bool of_resource = cx.cb_rsrc_dattr.ra_cb_ID != 0;
-    rsrc_dattr_t &target = of_resource ? cx.cb_rsrc_dattr : cx.cb_rsrc_dattrC;
+    bool of_resource = cx.staged.cb_rsrc_dattr.ra_cb_ID != 0;
+    rsrc_dattr_t &target = of_resource ? cx.staged.cb_rsrc_dattr : cx.staged.cb_rsrc_dattrC;
     if (of_resource)
-        cx.dattr_range_type = type;
+        cx.range.dattr_range_type = type;
     copied(line, &target.ra_max_value, converted(line, type, max), type, COPY_ERROR);
     copied(line, &target.ra_min_value, converted(line, type, line.value), type, DATA_ERROR);
 }
@@ -292,17 +295,17 @@ void store_range(const attr_line &line) {
 void store_sd_name(const attr_line &line) {
     cdb_ref_t name = {{add_to_tbl(line.cx, strings_of(line), line.value, line.length + 1), 0}};
     store(field_of(line), name);
-    line.cx.sd_name_found = 1;
+    line.cx.sd.element.sd_name_found = 1;
 }
 
 void store_sd_description(const attr_line &line) {
     store_integer<vx_uint16_t>(line);
-    line.cx.sd_desc_found = 1;
+    line.cx.sd.element.sd_desc_found = 1;
 }
 
 void store_sd_display(const attr_line &line) {
     store_integer<vx_uint16_t>(line);
-    line.cx.sd_disp_found = 1;
+    line.cx.sd.element.sd_disp_found = 1;
 }
 
 /* Text that is no number leaves the latest index, which then is not the expected one. */
@@ -310,13 +313,14 @@ void check_sd_index(const attr_line &line) {
     cdgen &cx = line.cx;
     vx_value_t index = {};
     if (str_to_vx(cx, &index, VX_UINT32, line.value, cx.line_texts) == 0)
-        cx.curr_sdeli = static_cast<int>(index.val_uint32);
-    if (cx.curr_sdeli != cx.expected_sdeli) {
-        if (cx.explanations != nullptr)
-            fprintf(cx.explanations, "curr_sdel = %d, expected_sdeli = %d\n", cx.curr_sdeli, cx.expected_sdeli);
+        cx.sd.curr_sdeli = static_cast<int>(index.val_uint32);
+    if (cx.sd.curr_sdeli != cx.sd.expected_sdeli) {
+        if (cx.options.explanations != nullptr)
+            fprintf(cx.options.explanations, "curr_sdel = %d, expected_sdeli = %d\n", cx.sd.curr_sdeli,
+                    cx.sd.expected_sdeli);
         source_error(cx, MSG_INDEX_NOT_CONSECUTIVE);
     }
-    cx.expected_sdeli = static_cast<int>(static_cast<unsigned>(cx.curr_sdeli) + 1);
+    cx.sd.expected_sdeli = static_cast<int>(static_cast<unsigned>(cx.sd.curr_sdeli) + 1);
 }
 
 /* An unknown type is deliberately no error here. */
@@ -326,20 +330,20 @@ void store_sd_data_type(const attr_line &line) {
     if (is_sd(type))
         source_error(cx, MSG_SD_IN_SD);
     store(field_of(line), type);
-    cx.sd_dt_found = 1;
-    if (cx.attr_dflt_val == nullptr)
+    cx.sd.element.sd_dt_found = 1;
+    if (cx.sd.attr_dflt_val == nullptr)
         return;
     dflt_tbl &dflt = line.state.dflt;
     *static_cast<vx_value_t *>(alloc_tble(cx, &dflt.tbl->cells, sizeof(vx_value_t))) = {
         .val_uint32 = static_cast<vx_uint32_t>(type)};
     ++dflt.num_elems;
-    ++cx.sd_num_elems;
+    ++cx.sd.sd_num_elems;
 }
 
 void store_sd_valid_value(const attr_line &line) {
-    if (!line.cx.sd_vv_found) {
+    if (!line.cx.sd.element.sd_vv_found) {
         store(field_of(line), cdb_ref_t{{mk_vv_sec(line.cx), 0}});
-        line.cx.sd_vv_found = 1;
+        line.cx.sd.element.sd_vv_found = 1;
     }
     add_valid_value(line);
 }

@@ -1,7 +1,13 @@
 /* cdgen_bld.cpp: sizes, creates, maps and fills the output file. The image is written once, by a cursor that only moves
  * forward. Records go in and out of it by copying, since sections are not aligned. */
 
-#include "compiler/cdgen.h"
+#include "compiler/cdgen_image.h"
+
+#include "compiler/above_stdio.h"
+#include "compiler/cdgen_context.h"
+#include "compiler/cdgen_process.h"
+#include "compiler/cdgen_swap.h"
+#include "format/checksum.h"
 #include "format/sections.h"
 
 #include <algorithm>
@@ -95,11 +101,11 @@ bool is_stream(const struct stat &file, int stream) {
  * file. */
 void refuse_own_files(cdgen &cx) {
     struct stat st = {};
-    if (stat(cx.cdefname, &st) != 0)
+    if (stat(cx.options.cdefname, &st) != 0)
         return;
-    if (st.st_dev == cx.cdb_fp.device && st.st_ino == cx.cdb_fp.inode)
+    if (st.st_dev == cx.source.cdb_fp.device && st.st_ino == cx.source.cdb_fp.inode)
         bld_error_exit(MSG_CANNOT_CREATE, "it is the source file", nullptr, 1);
-    if (cx.debugLevel > 0 && (is_stream(st, STDOUT_FILENO) || is_stream(st, STDERR_FILENO)))
+    if (cx.options.debugLevel > 0 && (is_stream(st, STDOUT_FILENO) || is_stream(st, STDERR_FILENO)))
         bld_error_exit(MSG_CANNOT_CREATE, "traces go there", nullptr, 1);
 }
 
@@ -107,13 +113,13 @@ void refuse_own_files(cdgen &cx) {
 int create_output(cdgen &cx) {
     refuse_own_files(cx);
     struct stat st = {};
-    output_fd out(above_stdio(open(cx.cdefname, O_RDWR | O_CREAT | O_CLOEXEC, 0644)));
+    output_fd out(above_stdio(open(cx.options.cdefname, O_RDWR | O_CREAT | O_CLOEXEC, 0644)));
     if (out.fd < 0)
         cannot(MSG_CANNOT_CREATE, errno);
     if (fstat(out.fd, &st) != 0)
         cannot(MSG_CANNOT_MAP, errno);
     if (S_ISREG(st.st_mode))
-        set_unfinished_output(cx.cdefname);
+        set_unfinished_output(cx.options.cdefname);
     if (S_ISREG(st.st_mode) && st.st_size > 0 && ftruncate(out.fd, 0) != 0)
         cannot(MSG_CANNOT_CREATE, errno);
     return out.release();
@@ -145,15 +151,15 @@ char *get_mapfile(cdgen &cx, size_t size) {
     output_fd out(create_output(cx));
     struct stat st = {};
     if (fstat(out.fd, &st) == 0 && !S_ISFIFO(st.st_mode))
-        cx.gross_file_size = prefill(out.fd, size);
+        cx.output.gross_file_size = prefill(out.fd, size);
     if (fstat(out.fd, &st) != 0)
         cannot(MSG_CANNOT_MAP, errno);
     size_t length = S_ISREG(st.st_mode) ? static_cast<size_t>(st.st_size) : 0;
     void *mapped = mmap(nullptr, length, PROT_READ | PROT_WRITE, MAP_SHARED, out.fd, 0);
     if (mapped == MAP_FAILED)
         cannot(MSG_CANNOT_MAP, errno);
-    cx.cdb_mapfile_fd = out.release();
-    cx.cdb_mapfile_ptr = mapped;
+    cx.output.cdb_mapfile_fd = out.release();
+    cx.output.cdb_mapfile_ptr = mapped;
     return static_cast<char *>(mapped);
 }
 
@@ -168,11 +174,11 @@ template <class Record> void store(char *to, const Record &record) {
 }
 
 void flush_mapfile(cdgen &cx) {
-    auto final_size = static_cast<off_t>(load<orb_cdb_header_t>(cx.chp).cdb_hdr_length) + 4;
-    if (cx.swap_endianness)
-        cdgen_cdef_swap(cx.chp, cx.nowhere);
-    munmap(std::exchange(cx.cdb_mapfile_ptr, nullptr), cx.gross_file_size);
-    int fd = std::exchange(cx.cdb_mapfile_fd, 0);
+    auto final_size = static_cast<off_t>(load<orb_cdb_header_t>(cx.image.chp).cdb_hdr_length) + 4;
+    if (cx.options.swap_endianness)
+        cdgen_cdef_swap(cx.image.chp, cx.stray.nowhere);
+    munmap(std::exchange(cx.output.cdb_mapfile_ptr, nullptr), cx.output.gross_file_size);
+    int fd = std::exchange(cx.output.cdb_mapfile_fd, 0);
     [[maybe_unused]] int truncated = ftruncate(fd, final_size);
     set_unfinished_output(nullptr);
     close(fd);
@@ -186,7 +192,7 @@ public:
     section(cdgen &context, cdb_dsect_type_t type) : cx(context), anchor{type, offset_in_file(), 0, 0} {}
 
     char *write(const void *bytes, size_t size) {
-        char *at = cx.dsp;
+        char *at = cx.image.dsp;
         reserve(size);
         if (size > 0)
             memcpy(at, bytes, size);
@@ -209,20 +215,20 @@ public:
     }
 
     void finish() {
-        store(cx.dsect_anchs + sizeof anchor * static_cast<size_t>(cx.dsect_idx), anchor);
-        ++cx.dsect_idx;
+        store(cx.image.dsect_anchs + sizeof anchor * static_cast<size_t>(cx.image.dsect_idx), anchor);
+        ++cx.image.dsect_idx;
     }
 
 private:
     vx_uint32_t offset_in_file() const {
-        return static_cast<vx_uint32_t>(cx.dsp - cx.chp);
+        return static_cast<vx_uint32_t>(cx.image.dsp - cx.image.chp);
     }
 
     /* The image has been sized before; only tables that no stanza fills are not counted. */
     void reserve(size_t size) {
-        if (size > static_cast<size_t>(cx.chp + cx.gross_file_size - cx.dsp))
+        if (size > static_cast<size_t>(cx.image.chp + cx.output.gross_file_size - cx.image.dsp))
             bld_error_exit(MSG_IMAGE_TOO_SMALL, nullptr, nullptr, 1);
-        cx.dsp += size;
+        cx.image.dsp += size;
         anchor.cda_length += static_cast<vx_uint32_t>(size);
     }
 
@@ -232,11 +238,12 @@ private:
 
 /* The places of references that are none, once the class's tables have theirs. Classes are the first sections. */
 void note_nowhere(cdgen &cx, const rsrc_class_t &record, const char *at) {
-    for (; cx.strays_done < cx.strays.size(); ++cx.strays_done) {
-        const stray_reference &stray = cx.strays[cx.strays_done];
-        if (stray.rsrc_class != cx.dsect_idx)
+    for (; cx.stray.strays_done < cx.stray.strays.size(); ++cx.stray.strays_done) {
+        const stray_reference &stray = cx.stray.strays[cx.stray.strays_done];
+        if (stray.rsrc_class != cx.image.dsect_idx)
             break;
-        cx.nowhere.push_back(static_cast<size_t>(at - cx.chp) + (record.*stray.records).offset[0] + stray.offset);
+        cx.stray.nowhere.push_back(static_cast<size_t>(at - cx.image.chp) + (record.*stray.records).offset[0] +
+                                   stray.offset);
     }
 }
 
@@ -245,7 +252,7 @@ void add_class(cdgen &cx, const rsrc_class_t &staged) {
     char *at = out.write(&staged, sizeof staged);
     rsrc_class_t record = staged;
     for (const cdb::side_table &table : cdb::side_tables) {
-        auto offset = static_cast<vx_uint32_t>(cx.dsp - at);
+        auto offset = static_cast<vx_uint32_t>(cx.image.dsp - at);
         record.*table.ref = {{table.form == cdb::table_form::UNLOCATED ? 0 : offset, 0}};
         if (table.form == cdb::table_form::ROUNDED)
             out.write_rounded(staged_content(staged.*table.ref));
@@ -315,71 +322,57 @@ orb_timeval32_t timestamp() {
 }
 
 void write_header(cdgen &cx) {
-    auto header = load<orb_cdb_header_t>(cx.chp); /* the maximum IDs are there already */
-    header.cdb_hdr_length = static_cast<vx_uint32_t>(cx.dsp - cx.chp - 4);
+    auto header = load<orb_cdb_header_t>(cx.image.chp); /* the maximum IDs are there already */
+    header.cdb_hdr_length = static_cast<vx_uint32_t>(cx.image.dsp - cx.image.chp - 4);
     header.cdb_hdr_format = CDB_FORMAT;
     header.cdb_hdr_seqno = 0;
     header.cdb_hdr_timestamp = timestamp();
-    header.cdb_hdr_dsect_count = static_cast<vx_uint32_t>(cx.dsect_count);
+    header.cdb_hdr_dsect_count = static_cast<vx_uint32_t>(cx.image.dsect_count);
     for (const cdb::recorded_size &recorded : cdb::recorded_sizes)
         store(reinterpret_cast<char *>(&header) + recorded.at, static_cast<vx_uint16_t>(recorded.size));
-    store(cx.chp, header);
-    header.cdb_hdr_checksum = cdb_checksum(cx.chp, header.cdb_hdr_length, header.cdb_hdr_length);
-    store(cx.chp, header);
+    store(cx.image.chp, header);
+    header.cdb_hdr_checksum = cdb_checksum(cx.image.chp, header.cdb_hdr_length, header.cdb_hdr_length);
+    store(cx.image.chp, header);
 }
 
 } // namespace
 
-vx_uint32_t cdb_checksum(const char *image, vx_uint32_t start, vx_uint32_t length) {
-    const char *word = image + offsetof(orb_cdb_header_t, cdb_hdr_format);
-    size_t words = (length - 4) / 4;
-    std::array<vx_uint64_t, 4> sums = {}; /* two words at a time in each: XOR does not mind the order */
-    for (; words >= 8; words -= 8)
-        for (vx_uint64_t &sum : sums) {
-            sum ^= load<vx_uint64_t>(word);
-            word += sizeof sum;
-        }
-    vx_uint64_t pairs = sums[0] ^ sums[1] ^ sums[2] ^ sums[3];
-    vx_uint32_t sum = start ^ static_cast<vx_uint32_t>(pairs) ^ static_cast<vx_uint32_t>(pairs >> 32);
-    for (; words > 0; --words, word += sizeof sum)
-        sum ^= load<vx_uint32_t>(word);
-    return sum;
-}
-
 size_t cdb_size(cdgen &cx) {
-    size_t size = sizeof(orb_cdb_header_t) + sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.dsect_count);
-    for (const auto &vc : records_of<rsrc_variable_class_t>(&cx.rsrc_var_class_tbl))
+    size_t size = sizeof(orb_cdb_header_t) + sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.image.dsect_count);
+    for (const auto &vc : records_of<rsrc_variable_class_t>(&cx.sections.rsrc_var_class_tbl))
         size += sizeof vc + strings_size(vc.u_rvc_string_tbl) + round8(sizeof(var_id_t) * vc.rvc_var_count);
-    for (const auto &map : records_of<rsrc_cmmap_t>(&cx.rsrc_cmmap_tbl))
+    for (const auto &map : records_of<rsrc_cmmap_t>(&cx.sections.rsrc_cmmap_tbl))
         size += sizeof map + strings_size(map.u_rcm_strings);
-    for (auto &rc : records_of<rsrc_class_t>(&cx.rsrc_class_tbl))
+    for (auto &rc : records_of<rsrc_class_t>(&cx.sections.rsrc_class_tbl))
         size += class_size(rc);
-    for (const auto &mgr : records_of<rsrc_mgr_t>(&cx.rsrc_mgr_tbl))
+    for (const auto &mgr : records_of<rsrc_mgr_t>(&cx.sections.rsrc_mgr_tbl))
         size += sizeof mgr + strings_size(mgr.u_rm_strings_table);
     return checked_size(size);
 }
 
 void add_rsrc_class_tbls(cdgen &cx) {
-    add_all<rsrc_class_t>(cx, &cx.rsrc_class_tbl, MSG_NO_CLASS_TABLES, add_class);
-    store(cx.chp + offsetof(orb_cdb_header_t, cdb_hdr_max_class_id),
-          max_id(&cx.rsrc_class_tbl, &rsrc_class_t::rc_class_id));
+    add_all<rsrc_class_t>(cx, &cx.sections.rsrc_class_tbl, MSG_NO_CLASS_TABLES, add_class);
+    store(cx.image.chp + offsetof(orb_cdb_header_t, cdb_hdr_max_class_id),
+          max_id(&cx.sections.rsrc_class_tbl, &rsrc_class_t::rc_class_id));
 }
 
 void add_rsrc_mgr_tbls(cdgen &cx) {
-    add_all<rsrc_mgr_t>(cx, &cx.rsrc_mgr_tbl, MSG_NO_MANAGER_TABLES, add_mgr);
-    store(cx.chp + offsetof(orb_cdb_header_t, cdb_hdr_max_rm_id), max_id(&cx.rsrc_mgr_tbl, &rsrc_mgr_t::rm_id));
+    add_all<rsrc_mgr_t>(cx, &cx.sections.rsrc_mgr_tbl, MSG_NO_MANAGER_TABLES, add_mgr);
+    store(cx.image.chp + offsetof(orb_cdb_header_t, cdb_hdr_max_rm_id),
+          max_id(&cx.sections.rsrc_mgr_tbl, &rsrc_mgr_t::rm_id));
 }
 
 void add_rsrc_cmmap_tbls(cdgen &cx) {
-    add_all<rsrc_cmmap_t>(cx, &cx.rsrc_cmmap_tbl, MSG_NO_MAP_TABLES, add_cmmap);
+    add_all<rsrc_cmmap_t>(cx, &cx.sections.rsrc_cmmap_tbl, MSG_NO_MAP_TABLES, add_cmmap);
 }
 
 void add_rsrc_var_class_tbls(cdgen &cx) {
-    add_all<rsrc_variable_class_t>(cx, &cx.rsrc_var_class_tbl, MSG_NO_VARIABLE_CLASS_TABLES, add_var_class);
+    add_all<rsrc_variable_class_t>(cx, &cx.sections.rsrc_var_class_tbl, MSG_NO_VARIABLE_CLASS_TABLES, add_var_class);
 }
 
 size_t fit_image(cdgen &cx) {
-    cx.dsect_count = cx.rsrc_cmmap_count + cx.rsrc_mgr_count + cx.rsrc_var_class_count + cx.rsrc_class_count;
+    cx.image.dsect_count = cx.sections.rsrc_cmmap_count + cx.sections.rsrc_mgr_count +
+                           cx.sections.rsrc_var_class_count + cx.sections.rsrc_class_count;
     return cdb_size(cx);
 }
 
@@ -401,24 +394,24 @@ struct discarding {
 
 void bld_cdb(cdgen &cx) {
     discarding unless_finished(cx);
-    cx.chp = get_mapfile(cx, fit_image(cx));
-    cx.dsect_anchs = cx.chp + sizeof(orb_cdb_header_t);
-    cx.dsect_idx = 0;
-    cx.dsp = cx.dsect_anchs + sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.dsect_count);
+    cx.image.chp = get_mapfile(cx, fit_image(cx));
+    cx.image.dsect_anchs = cx.image.chp + sizeof(orb_cdb_header_t);
+    cx.image.dsect_idx = 0;
+    cx.image.dsp = cx.image.dsect_anchs + sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.image.dsect_count);
     add_rsrc_class_tbls(cx);
     add_rsrc_mgr_tbls(cx);
     add_rsrc_cmmap_tbls(cx);
-    if (cx.rsrc_var_class_tbl.tbl_base != nullptr)
+    if (cx.sections.rsrc_var_class_tbl.tbl_base != nullptr)
         add_rsrc_var_class_tbls(cx);
     write_header(cx);
     flush_mapfile(cx);
 }
 
 void discard_mapfile(cdgen &cx) {
-    if (cx.cdb_mapfile_fd <= 0)
+    if (cx.output.cdb_mapfile_fd <= 0)
         return;
-    if (cx.cdb_mapfile_ptr != nullptr)
-        munmap(std::exchange(cx.cdb_mapfile_ptr, nullptr), cx.gross_file_size);
-    close(std::exchange(cx.cdb_mapfile_fd, 0));
-    remove(cx.cdefname);
+    if (cx.output.cdb_mapfile_ptr != nullptr)
+        munmap(std::exchange(cx.output.cdb_mapfile_ptr, nullptr), cx.output.gross_file_size);
+    close(std::exchange(cx.output.cdb_mapfile_fd, 0));
+    remove(cx.options.cdefname);
 }

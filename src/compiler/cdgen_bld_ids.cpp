@@ -1,6 +1,8 @@
 /* cdgen_bld_ids.cpp: the variable IDs of each variable class. */
 
-#include "compiler/cdgen.h"
+#include "compiler/cdgen_variable_ids.h"
+
+#include "compiler/cdgen_context.h"
 
 #include <bit>
 #include <functional>
@@ -77,7 +79,7 @@ void take_ids(cdgen &cx, std::optional<class_index> &index, const rsrc_class_t &
         vx_uint32_t name = attr.u_ra_vclass.offset[0];
         if (name != CDB_NONE) {
             if (!index)
-                index.emplace(records_of<rsrc_variable_class_t>(&cx.rsrc_var_class_tbl));
+                index.emplace(records_of<rsrc_variable_class_t>(&cx.sections.rsrc_var_class_tbl));
             add_varID_to_var_class(cx, *index, static_cast<const char *>(tbl_at(strings, name, 1)),
                                    static_cast<var_id_t>(attr.ra_attr_id) | mark);
         }
@@ -89,27 +91,21 @@ void take_ids(cdgen &cx, std::optional<class_index> &index, const rsrc_class_t &
 
 void bld_var_id_tbls(cdgen &cx) {
     std::optional<class_index> index; /* made if there is a name to look up */
-    for (const rsrc_class_t &rsrc_class : records_of<rsrc_class_t>(&cx.rsrc_class_tbl)) {
+    for (const rsrc_class_t &rsrc_class : records_of<rsrc_class_t>(&cx.sections.rsrc_class_tbl)) {
         take_ids(cx, index, rsrc_class, rsrc_class.u_rc_dattrsC, VAR_ID_CLASS_ATTR);
         take_ids(cx, index, rsrc_class, rsrc_class.u_rc_dattrs, 0);
     }
 }
 
 tbl *find_tbl_entry(cdgen &cx, const rsrc_variable_class_t *rvcp) {
-    for (size_t i = 0; i < cx.tbl_entry_used; ++i)
-        if (cx.tbl_entries[i].rvcp == rvcp)
-            return cx.tbl_entries[i].tp;
+    for (size_t i = 0; i < cx.variable_ids.tbl_entry_used; ++i)
+        if (cx.variable_ids.tbl_entries[i].rvcp == rvcp)
+            return cx.variable_ids.tbl_entries[i].tp;
     return nullptr;
 }
 
 void add_tbl_entry(cdgen &cx, const rsrc_variable_class_t *rvcp, tbl *entry_ptr) {
-    if (cx.tbl_entry_used == cx.tbl_entries.size())
+    if (cx.variable_ids.tbl_entry_used == cx.variable_ids.tbl_entries.size())
         bld_error_exit(MSG_TOO_MANY_VARIABLE_CLASSES, nullptr, nullptr, 1);
-    cx.tbl_entries[cx.tbl_entry_used++] = {rvcp, entry_ptr};
-}
-
-void del_tbl_entry(cdgen &cx, const rsrc_variable_class_t *rvcp) {
-    for (size_t i = 0; i < cx.tbl_entry_used; ++i)
-        if (cx.tbl_entries[i].rvcp == rvcp)
-            cx.tbl_entries[i] = {};
+    cx.variable_ids.tbl_entries[cx.variable_ids.tbl_entry_used++] = {rvcp, entry_ptr};
 }

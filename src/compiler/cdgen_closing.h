@@ -2,7 +2,7 @@
 #ifndef CDGEN_CDGEN_CLOSING_H
 #define CDGEN_CDGEN_CLOSING_H
 
-#include "compiler/cdgen.h"
+#include "compiler/cdgen_context.h"
 
 #include <span>
 

@@ -2,7 +2,7 @@
 
 #include "compiler/cdgen_error.h"
 
-#include "compiler/cdgen.h"
+#include "compiler/cdgen_context.h"
 
 std::array<const char *, 3> words_of(const fatal_exit &failure) {
     auto or_empty = [](const char *text) { return text == nullptr ? "" : text; };
@@ -23,5 +23,5 @@ void bld_error_exit(message_id id, const char *detail1, const char *detail2, int
 }
 
 void source_error(cdgen &cx, message_id id, const char *detail1, const char *detail2) {
-    cdgen_error_exit(id, detail1, detail2, cx.linenum, 1);
+    cdgen_error_exit(id, detail1, detail2, cx.source.linenum, 1);
 }

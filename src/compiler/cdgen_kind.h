@@ -2,7 +2,8 @@
 #ifndef CDGEN_CDGEN_KIND_H
 #define CDGEN_CDGEN_KIND_H
 
-#include "compiler/cdgen.h"
+#include "compiler/cdgen_context.h"
+#include "compiler/cdgen_kinds.h"
 
 constexpr vx_uint16_t NO_SD_IDX = 0xFFFF;
 constexpr vx_uint16_t NO_GROUP = 255;
@@ -19,12 +20,12 @@ inline bool was_given(const stanza_state &state, vx_uint32_t bit) {
 }
 
 inline void require_class(cdgen &cx, message_id message) {
-    if (cx.cb_rsrc_class.rc_cb_ID == 0)
+    if (cx.staged.cb_rsrc_class.rc_cb_ID == 0)
         source_error(cx, message);
 }
 
 inline void require_complete(cdgen &cx, stanza_id id) {
-    if (cx.stanzas[id].req_mask != sc_tables[id].req_mask_cmplt)
+    if (cx.framing.stanzas[id].req_mask != sc_tables[id].req_mask_cmplt)
         source_error(cx, MSG_INCOMPLETE_STANZA);
 }
 

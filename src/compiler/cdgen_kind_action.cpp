@@ -10,32 +10,32 @@ constexpr vx_uint32_t DEFAULT_PERMISSION = 0x40; /* letter s */
 /* What sets the two kinds apart. */
 struct action_kind {
     stanza_id id;
-    rsrc_action_t cdgen::*record;
+    rsrc_action_t staging_records::*record;
     cdb_ref_t rsrc_class_t::*records;
     vx_uint32_t cb_id;
 };
 
-constexpr action_kind resource_kind = {SC_RESOURCE_ACTION, &cdgen::cb_rsrc_action, &rsrc_class_t::u_rc_actions,
-                                       CDB_ID_ACTION};
-constexpr action_kind class_kind = {SC_CLASS_ACTION, &cdgen::cb_rsrc_actionC, &rsrc_class_t::u_rc_actionsC,
+constexpr action_kind resource_kind = {SC_RESOURCE_ACTION, &staging_records::cb_rsrc_action,
+                                       &rsrc_class_t::u_rc_actions, CDB_ID_ACTION};
+constexpr action_kind class_kind = {SC_CLASS_ACTION, &staging_records::cb_rsrc_actionC, &rsrc_class_t::u_rc_actionsC,
                                     CDB_ID_ACTION_C};
 
 constexpr message_id NO_CLASS = MSG_NO_CLASS_FOR_ACTION; /* deliberately for both kinds */
 
 void complete_action(cdgen &cx, const action_kind &kind) {
     completing(kind.id, [&] {
-        rsrc_action_t &action = cx.*kind.record;
+        rsrc_action_t &action = cx.staged.*kind.record;
         require_class(cx, NO_CLASS);
         require_complete(cx, kind.id);
-        if (!was_given(cx.stanzas[kind.id], PERMISSION_BIT))
+        if (!was_given(cx.framing.stanzas[kind.id], PERMISSION_BIT))
             action.ac_perms = DEFAULT_PERMISSION;
-        append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), action);
+        append_record(cx, staged_tbl(cx.staged.cb_rsrc_class.*kind.records), action);
         action.ac_cb_ID = 0;
     });
 }
 
 void start_action(cdgen &cx, const action_kind &kind) {
-    rsrc_action_t &action = cx.*kind.record;
+    rsrc_action_t &action = cx.staged.*kind.record;
     require_class(cx, NO_CLASS);
     if (action.ac_cb_ID != 0)
         complete_action(cx, kind);
@@ -44,7 +44,7 @@ void start_action(cdgen &cx, const action_kind &kind) {
     action.u_ac_variety_list.offset[0] = mk_vty_sec(cx);
     mark_absent(action.u_ac_sd_input);
     mark_absent(action.u_ac_sd_resp);
-    cx.vvdisp.reset();
+    cx.valid_values.vvdisp.reset();
 }
 
 } // namespace

@@ -9,22 +9,22 @@ namespace {
 /* What sets the two kinds apart. */
 struct dattr_kind {
     stanza_id id;
-    rsrc_dattr_t cdgen::*record;
-    vx_uint16_t cdgen::*vv_found; /* the stanza already has its list of valid values */
+    rsrc_dattr_t staging_records::*record;
+    vx_uint16_t valid_value_lists::*vv_found; /* the stanza already has its list of valid values */
     cdb_ref_t rsrc_class_t::*records;
     vx_uint32_t cb_id;
     bool shows_masks; /* deliberate: only the class kind prints its masks before it is found incomplete */
 };
 
 constexpr dattr_kind resource_kind = {.id = SC_DYNAMIC_RESOURCE_ATTRIBUTE,
-                                      .record = &cdgen::cb_rsrc_dattr,
-                                      .vv_found = &cdgen::dattr_vv_found,
+                                      .record = &staging_records::cb_rsrc_dattr,
+                                      .vv_found = &valid_value_lists::dattr_vv_found,
                                       .records = &rsrc_class_t::u_rc_dattrs,
                                       .cb_id = CDB_ID_DATTR,
                                       .shows_masks = false};
 constexpr dattr_kind class_kind = {.id = SC_DYNAMIC_CLASS_ATTRIBUTE,
-                                   .record = &cdgen::cb_rsrc_dattrC,
-                                   .vv_found = &cdgen::dattrC_vv_found,
+                                   .record = &staging_records::cb_rsrc_dattrC,
+                                   .vv_found = &valid_value_lists::dattrC_vv_found,
                                    .records = &rsrc_class_t::u_rc_dattrsC,
                                    .cb_id = CDB_ID_DATTR_C,
                                    .shows_masks = true};
@@ -43,7 +43,7 @@ void mark_absent(vx_value_t &value) {
 
 /* A default bound, in containers of its own. */
 void default_bound(cdgen &cx, vx_value_t *bound, vx_data_type_t type, int mode, message_id failure) {
-    tbl *strings = staged_tbl(cx.cb_rsrc_class.u_rc_strings);
+    tbl *strings = staged_tbl(cx.staged.cb_rsrc_class.u_rc_strings);
     sd_anchors anchors;
     int result = type == VX_SD_PTR_ARRAY ? copy_this_sd_type(cx, bound, VX_INT32, mode, strings, &anchors, 0, type)
                                          : copy_this_type(cx, bound, nullptr, type, mode, strings, &anchors.array, 1);
@@ -55,20 +55,20 @@ void settle_range(cdgen &cx, rsrc_dattr_t &attr) {
     if (has_no_range(attr.ra_data_type)) {
         mark_absent(attr.ra_min_value);
         mark_absent(attr.ra_max_value);
-    } else if (!cx.dattr_range_found) {
-        cx.dattr_range_type = VX_UNKNOWN;
+    } else if (!cx.range.dattr_range_found) {
+        cx.range.dattr_range_type = VX_UNKNOWN;
         default_bound(cx, &attr.ra_min_value, attr.ra_data_type, R_LO_DEFAULT, MSG_NO_LOWER_BOUND);
         default_bound(cx, &attr.ra_max_value, attr.ra_data_type, R_HI_DEFAULT, MSG_NO_UPPER_BOUND);
     }
-    cx.dattr_range_found = 0;
+    cx.range.dattr_range_found = 0;
 }
 
 /* Structured data get their initial value from the SD stanzas that follow. */
 void settle_initial_value(cdgen &cx, const dattr_kind &kind, rsrc_dattr_t &attr) {
     if (scalar_vx(attr.ra_data_type) == VX_SD_PTR)
         return;
-    tbl *strings = staged_tbl(cx.cb_rsrc_class.u_rc_strings);
-    const dflt_tbl &dflt = cx.stanzas[kind.id].dflt;
+    tbl *strings = staged_tbl(cx.staged.cb_rsrc_class.u_rc_strings);
+    const dflt_tbl &dflt = cx.framing.stanzas[kind.id].dflt;
     tbl_anchor array;
     if (has_values(dflt))
         dump_dflt(cx, strings, &dflt, &attr.ra_init_value, attr.ra_data_type);
@@ -77,7 +77,7 @@ void settle_initial_value(cdgen &cx, const dattr_kind &kind, rsrc_dattr_t &attr)
 }
 
 void open_dattr(cdgen &cx, const dattr_kind &kind) {
-    rsrc_dattr_t &attr = cx.*kind.record;
+    rsrc_dattr_t &attr = cx.staged.*kind.record;
     attr = {};
     attr.ra_cb_ID = kind.cb_id;
     attr.u_ra_variety_list.offset[0] = mk_vty_sec(cx);
@@ -87,38 +87,38 @@ void open_dattr(cdgen &cx, const dattr_kind &kind) {
     attr.ra_max_sd_idx = NO_SD_IDX;
     mark_absent(attr.u_ra_sd);
     if (kind.id == resource_kind.id)
-        cx.dattr_range_type = VX_UNKNOWN;
-    cx.vvdisp.reset();
-    cx.*kind.vv_found = 0;
+        cx.range.dattr_range_type = VX_UNKNOWN;
+    cx.valid_values.vvdisp.reset();
+    cx.valid_values.*kind.vv_found = 0;
 }
 
 void show_masks(cdgen &cx, stanza_id id) {
-    if (cx.explanations == nullptr || cx.stanzas[id].req_mask == sc_tables[id].req_mask_cmplt)
+    if (cx.options.explanations == nullptr || cx.framing.stanzas[id].req_mask == sc_tables[id].req_mask_cmplt)
         return;
-    fprintf(cx.explanations, "scp->req_mask:         %x\n", cx.stanzas[id].req_mask);
-    fprintf(cx.explanations, "scp->req_mask_cmplt:   %x\n", sc_tables[id].req_mask_cmplt);
+    fprintf(cx.options.explanations, "scp->req_mask:         %x\n", cx.framing.stanzas[id].req_mask);
+    fprintf(cx.options.explanations, "scp->req_mask_cmplt:   %x\n", sc_tables[id].req_mask_cmplt);
 }
 
 void complete_dattr(cdgen &cx, const dattr_kind &kind) {
     completing(kind.id, [&] {
-        rsrc_dattr_t &attr = cx.*kind.record;
+        rsrc_dattr_t &attr = cx.staged.*kind.record;
         require_class(cx, NO_CLASS);
         if (kind.shows_masks)
             show_masks(cx, kind.id);
         require_complete(cx, kind.id);
-        settle_valid_vals(attr, cx.*kind.vv_found);
+        settle_valid_vals(attr, cx.valid_values.*kind.vv_found);
         settle_range(cx, attr);
         settle_initial_value(cx, kind, attr);
-        settle_group(attr, cx.stanzas[kind.id]);
+        settle_group(attr, cx.framing.stanzas[kind.id]);
         note_stray_range(cx, attr, kind.records);
-        append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), attr);
+        append_record(cx, staged_tbl(cx.staged.cb_rsrc_class.*kind.records), attr);
         attr.ra_cb_ID = 0;
     });
 }
 
 void start_dattr(cdgen &cx, const dattr_kind &kind) {
     require_class(cx, NO_CLASS);
-    if ((cx.*kind.record).ra_cb_ID != 0)
+    if ((cx.staged.*kind.record).ra_cb_ID != 0)
         complete_dattr(cx, kind);
     open_dattr(cx, kind);
 }
@@ -132,12 +132,12 @@ bool is_array_of_numbers(vx_data_type_t type) {
 void note_stray_range(cdgen &cx, const rsrc_dattr_t &attr, cdb_ref_t rsrc_class_t::*records) {
     vx_data_type_t type = attr.ra_data_type;
     bool refers = has_no_range(type) || is_vx_array(type);
-    bool sound = is_array_of_numbers(type) && is_array_of_numbers(cx.dattr_range_type);
-    if (attr.ra_cb_ID != CDB_ID_DATTR || cx.dattr_range_type == VX_UNKNOWN || !refers || sound)
+    bool sound = is_array_of_numbers(type) && is_array_of_numbers(cx.range.dattr_range_type);
+    if (attr.ra_cb_ID != CDB_ID_DATTR || cx.range.dattr_range_type == VX_UNKNOWN || !refers || sound)
         return;
-    size_t record = staged_tbl(cx.cb_rsrc_class.*records)->used();
+    size_t record = staged_tbl(cx.staged.cb_rsrc_class.*records)->used();
     for (size_t bound : {offsetof(rsrc_dattr_t, ra_min_value), offsetof(rsrc_dattr_t, ra_max_value)})
-        cx.strays.push_back({cx.rsrc_class_count, records, record + bound});
+        cx.stray.strays.push_back({cx.sections.rsrc_class_count, records, record + bound});
 }
 
 void init_dattr_tbl(cdgen &cx) {

@@ -11,8 +11,8 @@ constexpr vx_uint32_t OPT_FOR_DEFINE = 0x8;
 /* What sets the two kinds apart. */
 struct pattr_kind {
     stanza_id id;
-    rsrc_pattr_t cdgen::*record;
-    vx_uint16_t cdgen::*vv_found; /* the stanza already has its list of valid values */
+    rsrc_pattr_t staging_records::*record;
+    vx_uint16_t valid_value_lists::*vv_found; /* the stanza already has its list of valid values */
     cdb_ref_t rsrc_class_t::*records;
     vx_uint32_t cb_id;
     message_id no_class;
@@ -21,16 +21,16 @@ struct pattr_kind {
 };
 
 constexpr pattr_kind resource_kind = {.id = SC_PERSISTENT_RESOURCE_ATTRIBUTE,
-                                      .record = &cdgen::cb_rsrc_pattr,
-                                      .vv_found = &cdgen::pattr_vv_found,
+                                      .record = &staging_records::cb_rsrc_pattr,
+                                      .vv_found = &valid_value_lists::pattr_vv_found,
                                       .records = &rsrc_class_t::u_rc_pattrs,
                                       .cb_id = CDB_ID_PATTR,
                                       .no_class = MSG_NO_CLASS_FOR_PATTR,
                                       .valid_vals_absent_at_open = false,
                                       .uses_default_values = true};
 constexpr pattr_kind class_kind = {.id = SC_PERSISTENT_CLASS_ATTRIBUTE,
-                                   .record = &cdgen::cb_rsrc_pattrC,
-                                   .vv_found = &cdgen::pattrC_vv_found,
+                                   .record = &staging_records::cb_rsrc_pattrC,
+                                   .vv_found = &valid_value_lists::pattrC_vv_found,
                                    .records = &rsrc_class_t::u_rc_pattrsC,
                                    .cb_id = CDB_ID_PATTR_C,
                                    .no_class = MSG_NO_CLASS_FOR_PATTR_C,
@@ -41,8 +41,8 @@ constexpr pattr_kind class_kind = {.id = SC_PERSISTENT_CLASS_ATTRIBUTE,
 void settle_default(cdgen &cx, const pattr_kind &kind, rsrc_pattr_t &attr) {
     if (scalar_vx(attr.ra_data_type) == VX_SD_PTR)
         return;
-    tbl *strings = staged_tbl(cx.cb_rsrc_class.u_rc_strings);
-    const dflt_tbl &dflt = cx.stanzas[kind.id].dflt;
+    tbl *strings = staged_tbl(cx.staged.cb_rsrc_class.u_rc_strings);
+    const dflt_tbl &dflt = cx.framing.stanzas[kind.id].dflt;
     tbl_anchor array;
     if (kind.uses_default_values && has_values(dflt))
         dump_dflt(cx, strings, &dflt, &attr.ra_dflt_value, attr.ra_data_type);
@@ -51,7 +51,7 @@ void settle_default(cdgen &cx, const pattr_kind &kind, rsrc_pattr_t &attr) {
 }
 
 void open_pattr(cdgen &cx, const pattr_kind &kind) {
-    rsrc_pattr_t &attr = cx.*kind.record;
+    rsrc_pattr_t &attr = cx.staged.*kind.record;
     attr = {};
     attr.ra_cb_ID = kind.cb_id;
     attr.u_ra_variety_list.offset[0] = mk_vty_sec(cx);
@@ -59,28 +59,28 @@ void open_pattr(cdgen &cx, const pattr_kind &kind) {
     if (kind.valid_vals_absent_at_open)
         mark_absent(attr.u_ra_valid_vals);
     attr.ra_max_sd_idx = NO_SD_IDX;
-    cx.vvdisp.reset();
-    cx.*kind.vv_found = 0;
+    cx.valid_values.vvdisp.reset();
+    cx.valid_values.*kind.vv_found = 0;
 }
 
 void complete_pattr(cdgen &cx, const pattr_kind &kind) {
     completing(kind.id, [&] {
-        rsrc_pattr_t &attr = cx.*kind.record;
+        rsrc_pattr_t &attr = cx.staged.*kind.record;
         require_class(cx, kind.no_class);
         require_complete(cx, kind.id);
-        settle_valid_vals(attr, cx.*kind.vv_found);
+        settle_valid_vals(attr, cx.valid_values.*kind.vv_found);
         settle_default(cx, kind, attr);
         if ((attr.ra_props & (REQD_FOR_DEFINE | OPT_FOR_DEFINE)) == 0)
             attr.ra_props |= INVAL_FOR_DEFINE;
-        settle_group(attr, cx.stanzas[kind.id]);
-        append_record(cx, staged_tbl(cx.cb_rsrc_class.*kind.records), attr);
+        settle_group(attr, cx.framing.stanzas[kind.id]);
+        append_record(cx, staged_tbl(cx.staged.cb_rsrc_class.*kind.records), attr);
         attr.ra_cb_ID = 0;
     });
 }
 
 void start_pattr(cdgen &cx, const pattr_kind &kind) {
     require_class(cx, kind.no_class);
-    if ((cx.*kind.record).ra_cb_ID != 0)
+    if ((cx.staged.*kind.record).ra_cb_ID != 0)
         complete_pattr(cx, kind);
     open_pattr(cx, kind);
 }

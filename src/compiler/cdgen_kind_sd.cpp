@@ -26,19 +26,19 @@ size_t next_sd_field(cdgen &cx, tbl *sd_defs, size_t section) {
 
 /* Files the staged element into the section of its run. */
 void file_element(cdgen &cx) {
-    if (!cx.sd_dt_found || !cx.sd_disp_found || !cx.sd_name_found || !cx.sd_desc_found)
+    if (!cx.sd.element.is_complete())
         source_error(cx, MSG_INCOMPLETE_STANZA);
-    cx.sd_dt_found = cx.sd_disp_found = cx.sd_name_found = cx.sd_desc_found = 0;
-    tbl *sd_defs = staged_tbl(cx.cb_rsrc_class.u_rc_sd_defs);
+    cx.sd.element.forget();
+    tbl *sd_defs = staged_tbl(cx.staged.cb_rsrc_class.u_rc_sd_defs);
     if (sd_defs == nullptr)
         source_error(cx, MSG_NO_SD_TABLE);
-    size_t section = cx.curr_sd_tbl->offset[0];
-    sd_field_t field = cx.cb_sd_def.sd_fields[0];
+    size_t section = cx.sd.curr_sd_tbl->offset[0];
+    sd_field_t field = cx.staged.cb_sd_def.sd_fields[0];
     field.sd_action_id = NO_ACTION_ID;
     field.sd_valid_type = VALID_TYPE;
-    if (!cx.sd_vv_found)
+    if (!cx.sd.element.sd_vv_found)
         mark_absent(field.u_sd_valid_vals);
-    cx.sd_vv_found = 0;
+    cx.sd.element.sd_vv_found = 0;
     size_t slot = next_sd_field(cx, sd_defs, section);
     *record_at<sd_field_t>(sd_defs, slot) = field;
     ++record_at<sd_def_t>(sd_defs, section)->sd_count;
@@ -46,10 +46,10 @@ void file_element(cdgen &cx) {
 
 /* The attribute's value is one of the defaults of the run's element types. */
 void dump_sd_default(cdgen &cx, const srtable_ctrl *scp) {
-    dflt_tbl &dflt = cx.stanzas[static_cast<size_t>(scp - sc_tables.data())].dflt;
+    dflt_tbl &dflt = cx.framing.stanzas[static_cast<size_t>(scp - sc_tables.data())].dflt;
     bool scalar = strcmp(dflt.tbl->cells.tbl_name, "VX_SD_PTR") == 0;
-    dflt.num_elems = cx.sd_num_elems;
-    dump_dflt(cx, staged_tbl(cx.cb_rsrc_class.u_rc_strings), &dflt, cx.attr_dflt_val,
+    dflt.num_elems = cx.sd.sd_num_elems;
+    dump_dflt(cx, staged_tbl(cx.staged.cb_rsrc_class.u_rc_strings), &dflt, cx.sd.attr_dflt_val,
               scalar ? VX_SD_PTR : VX_SD_PTR_ARRAY);
 }
 
@@ -58,7 +58,7 @@ void dump_sd_element(cdgen &cx, tbl *str_tbl, const dflt_tbl *vtbl, size_t i, vx
                      sd_anchors *anchors) {
     auto type =
         static_cast<vx_data_type_t>(record_at<vx_value_t>(&vtbl->tbl->cells, i * sizeof(vx_value_t))->val_uint32);
-    int mode = cx.sd_attr_type == 0 ? DFLT_DEFAULT : INIT_DEFAULT;
+    int mode = cx.sd.sd_attr_type == 0 ? DFLT_DEFAULT : INIT_DEFAULT;
     anchors->array.reset();
     auto count = static_cast<vx_uint32_t>(vtbl->num_elems);
     if (copy_this_sd_type(cx, lval, type, mode, str_tbl, anchors, count, dt) != 0)
@@ -68,46 +68,36 @@ void dump_sd_element(cdgen &cx, tbl *str_tbl, const dflt_tbl *vtbl, size_t i, vx
 } // namespace
 
 vx_uint32_t mk_sd_sec(cdgen &cx) {
-    return make_list(cx, staged_tbl(cx.cb_rsrc_class.u_rc_sd_defs), &sd_def_t::sd_cb_ID, CDB_ID_SD_DEF);
+    return make_list(cx, staged_tbl(cx.staged.cb_rsrc_class.u_rc_sd_defs), &sd_def_t::sd_cb_ID, CDB_ID_SD_DEF);
 }
 
 vx_uint32_t mk_vv_sec(cdgen &cx) {
-    return make_list(cx, staged_tbl(cx.cb_rsrc_class.u_rc_valid_vals), &valid_values_t::vv_cb_ID, CDB_ID_VALID_VALUES);
+    return make_list(cx, staged_tbl(cx.staged.cb_rsrc_class.u_rc_valid_vals), &valid_values_t::vv_cb_ID,
+                     CDB_ID_VALID_VALUES);
 }
 
 vx_uint32_t mk_vty_sec(cdgen &cx) {
-    return make_list(cx, staged_tbl(cx.cb_rsrc_class.u_rc_variety_lists), &variety_list_t::vl_cb_ID,
+    return make_list(cx, staged_tbl(cx.staged.cb_rsrc_class.u_rc_variety_lists), &variety_list_t::vl_cb_ID,
                      CDB_ID_VARIETY_LIST);
-}
-
-vx_uint32_t mk_sd_data_tbl(cdgen &cx, vx_data_type_t sd_type, tbl *dflt_tp) {
-    if (scalar_vx(sd_type) != VX_SD_PTR)
-        source_error(cx, MSG_NOT_AN_SD_TYPE);
-    size_t size = sd_type == VX_SD_PTR ? sizeof(vx_structured_data_t) : sizeof(vx_array_t);
-    auto *header = static_cast<char *>(alloc_tble(cx, dflt_tp, size));
-    return static_cast<vx_uint32_t>(header - dflt_tp->tbl_base);
 }
 
 void init_sd_tbl(cdgen &cx) {
     require_class(cx, NO_CLASS);
-    if (cx.cb_sd_def.sd_cb_ID != 0)
+    if (cx.staged.cb_sd_def.sd_cb_ID != 0)
         completing(SC_PATTR_SD_DEFINITION, [&] { file_element(cx); });
-    cx.cb_sd_def = {};
-    cx.cb_sd_def.sd_cb_ID = CDB_ID_SD_DEF;
-    cx.vvdisp.reset();
-    cx.sd_vv_found = 0;
+    cx.staged.cb_sd_def = {};
+    cx.staged.cb_sd_def.sd_cb_ID = CDB_ID_SD_DEF;
+    cx.valid_values.vvdisp.reset();
+    cx.sd.element.sd_vv_found = 0;
 }
 
 void cmplt_sd_tbl(cdgen &cx, const srtable_ctrl *scp) {
     require_class(cx, NO_CLASS);
     init_sd_tbl(cx); /* files the last element */
-    if (cx.attr_dflt_val != nullptr)
+    if (cx.sd.attr_dflt_val != nullptr)
         completing(SC_PATTR_SD_DEFINITION, [&] { dump_sd_default(cx, scp); });
-    if (cx.max_sd_idx != nullptr)
-        *cx.max_sd_idx = static_cast<vx_uint16_t>(cx.curr_sdeli);
-    cx.curr_sdeli = -1;
-    cx.expected_sdeli = 0;
-    cx.cb_sd_def.sd_cb_ID = 0;
+    cx.sd.end();
+    cx.staged.cb_sd_def.sd_cb_ID = 0;
 }
 
 void dump_dflt(cdgen &cx, tbl *str_tbl, const dflt_tbl *vtbl, vx_value_t *lval, vx_data_type_t dt) {

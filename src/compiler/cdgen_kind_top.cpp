@@ -20,16 +20,16 @@ constexpr cdb_ref_t rsrc_class_t::*absent_at_open[] = {
 
 /* A class without a Name is called what the output file is called in front of ".cdef", directory and all. */
 void default_class_name(cdgen &cx) {
-    const char *suffix = strstr(cx.cdefname, ".cdef"); /* deliberately the first, and not only at the end */
+    const char *suffix = strstr(cx.options.cdefname, ".cdef"); /* deliberately the first, and not only at the end */
     if (suffix == nullptr)
         cdgen_error_exit(MSG_INVALID_OUTPUT_NAME, nullptr, nullptr, 0, 1);
-    auto length = static_cast<size_t>(suffix - cx.cdefname);
+    auto length = static_cast<size_t>(suffix - cx.options.cdefname);
     std::unique_ptr<char, free_memory> name(static_cast<char *>(cfg_malloc(length + 1)));
-    memcpy(name.get(), cx.cdefname, length);
-    tbl *strings = staged_tbl(cx.cb_rsrc_class.u_rc_strings);
+    memcpy(name.get(), cx.options.cdefname, length);
+    tbl *strings = staged_tbl(cx.staged.cb_rsrc_class.u_rc_strings);
     if (strings == nullptr)
         source_error(cx, MSG_NO_STRING_TABLE);
-    cx.cb_rsrc_class.u_rc_name.offset[0] = add_to_tbl(cx, strings, name.get(), length + 1);
+    cx.staged.cb_rsrc_class.u_rc_name.offset[0] = add_to_tbl(cx, strings, name.get(), length + 1);
 }
 
 /* Deliberate: an attribute that a new class finds open goes into the old one as it is, unchecked. If it has no valid
@@ -38,9 +38,10 @@ template <class Attribute>
 void flush_raw(cdgen &cx, Attribute &attr, cdb_ref_t rsrc_class_t::*records, vx_uint16_t found) {
     if (attr.ra_cb_ID == 0)
         return;
-    tbl *filed = staged_tbl(cx.cb_rsrc_class.*records);
+    tbl *filed = staged_tbl(cx.staged.cb_rsrc_class.*records);
     if (!found && attr.u_ra_valid_vals.offset[0] == 0)
-        cx.strays.push_back({cx.rsrc_class_count, records, filed->used() + offsetof(Attribute, u_ra_valid_vals)});
+        cx.stray.strays.push_back(
+            {cx.sections.rsrc_class_count, records, filed->used() + offsetof(Attribute, u_ra_valid_vals)});
     if constexpr (std::is_same_v<Attribute, rsrc_dattr_t>)
         note_stray_range(cx, attr, records);
     append_record(cx, filed, attr);
@@ -50,7 +51,7 @@ void flush_raw(cdgen &cx, Attribute &attr, cdb_ref_t rsrc_class_t::*records, vx_
 } // namespace
 
 void init_cmmap_tbl(cdgen &cx) {
-    rsrc_cmmap_t &map = cx.cb_rsrc_cmmap;
+    rsrc_cmmap_t &map = cx.staged.cb_rsrc_cmmap;
     if (map.rcm_cb_ID != 0)
         cdgen_error_exit(MSG_SECOND_MAP, nullptr, nullptr, 0, 1);
     map = {};
@@ -59,16 +60,16 @@ void init_cmmap_tbl(cdgen &cx) {
 }
 
 void cmplt_cmmap_tbl(cdgen &cx) {
-    rsrc_cmmap_t &map = cx.cb_rsrc_cmmap;
+    rsrc_cmmap_t &map = cx.staged.cb_rsrc_cmmap;
     if (map.rcm_first_key > map.rcm_last_key)
         source_error(cx, MSG_KEYS_REVERSED);
-    append_record(cx, &cx.rsrc_cmmap_tbl, map);
-    ++cx.rsrc_cmmap_count;
+    append_record(cx, &cx.sections.rsrc_cmmap_tbl, map);
+    ++cx.sections.rsrc_cmmap_count;
     map.rcm_cb_ID = 0;
 }
 
 void init_mgr_tbl(cdgen &cx) {
-    rsrc_mgr_t &mgr = cx.cb_rsrc_mgr;
+    rsrc_mgr_t &mgr = cx.staged.cb_rsrc_mgr;
     if (mgr.rm_cb_ID != 0)
         cmplt_mgr_tbl(cx);
     mgr = {};
@@ -77,14 +78,14 @@ void init_mgr_tbl(cdgen &cx) {
 }
 
 void cmplt_mgr_tbl(cdgen &cx) {
-    rsrc_mgr_t *staged = append_record(cx, &cx.rsrc_mgr_tbl, cx.cb_rsrc_mgr);
-    staged->rm_id = static_cast<vx_uint16_t>(cx.rsrc_mgr_count);
-    ++cx.rsrc_mgr_count;
-    cx.cb_rsrc_mgr.rm_cb_ID = 0;
+    rsrc_mgr_t *staged = append_record(cx, &cx.sections.rsrc_mgr_tbl, cx.staged.cb_rsrc_mgr);
+    staged->rm_id = static_cast<vx_uint16_t>(cx.sections.rsrc_mgr_count);
+    ++cx.sections.rsrc_mgr_count;
+    cx.staged.cb_rsrc_mgr.rm_cb_ID = 0;
 }
 
 void init_var_class_tbl(cdgen &cx) {
-    rsrc_variable_class_t &variable_class = cx.cb_rsrc_variable_class;
+    rsrc_variable_class_t &variable_class = cx.staged.cb_rsrc_variable_class;
     if (variable_class.rvc_cb_ID != 0)
         cmplt_var_class_tbl(cx);
     variable_class = {};
@@ -94,14 +95,14 @@ void init_var_class_tbl(cdgen &cx) {
 }
 
 void cmplt_var_class_tbl(cdgen &cx) {
-    file_tbl(cx, cx.cb_rsrc_variable_class.u_rvc_string_tbl);
-    append_record(cx, &cx.rsrc_var_class_tbl, cx.cb_rsrc_variable_class);
-    ++cx.rsrc_var_class_count;
-    cx.cb_rsrc_variable_class.rvc_cb_ID = 0;
+    file_tbl(cx, cx.staged.cb_rsrc_variable_class.u_rvc_string_tbl);
+    append_record(cx, &cx.sections.rsrc_var_class_tbl, cx.staged.cb_rsrc_variable_class);
+    ++cx.sections.rsrc_var_class_count;
+    cx.staged.cb_rsrc_variable_class.rvc_cb_ID = 0;
 }
 
 void init_class_tbl(cdgen &cx) {
-    rsrc_class_t &rsrc_class = cx.cb_rsrc_class;
+    rsrc_class_t &rsrc_class = cx.staged.cb_rsrc_class;
     if (rsrc_class.rc_cb_ID != 0)
         cmplt_class_tbl(cx);
     rsrc_class = {};
@@ -116,16 +117,16 @@ void init_class_tbl(cdgen &cx) {
 void init_class_tbl_fake(cdgen &) {}
 
 void cmplt_class_tbl(cdgen &cx) {
-    rsrc_class_t &rsrc_class = cx.cb_rsrc_class;
+    rsrc_class_t &rsrc_class = cx.staged.cb_rsrc_class;
     if (rsrc_class.u_rc_name.offset[0] == CDB_NONE)
         default_class_name(cx);
-    flush_raw(cx, cx.cb_rsrc_pattrC, &rsrc_class_t::u_rc_pattrsC, cx.pattrC_vv_found);
-    flush_raw(cx, cx.cb_rsrc_dattrC, &rsrc_class_t::u_rc_dattrsC, cx.dattrC_vv_found);
-    flush_raw(cx, cx.cb_rsrc_pattr, &rsrc_class_t::u_rc_pattrs, cx.pattr_vv_found);
-    flush_raw(cx, cx.cb_rsrc_dattr, &rsrc_class_t::u_rc_dattrs, cx.dattr_vv_found);
+    flush_raw(cx, cx.staged.cb_rsrc_pattrC, &rsrc_class_t::u_rc_pattrsC, cx.valid_values.pattrC_vv_found);
+    flush_raw(cx, cx.staged.cb_rsrc_dattrC, &rsrc_class_t::u_rc_dattrsC, cx.valid_values.dattrC_vv_found);
+    flush_raw(cx, cx.staged.cb_rsrc_pattr, &rsrc_class_t::u_rc_pattrs, cx.valid_values.pattr_vv_found);
+    flush_raw(cx, cx.staged.cb_rsrc_dattr, &rsrc_class_t::u_rc_dattrs, cx.valid_values.dattr_vv_found);
     for (const cdb::side_table &table : cdb::side_tables_as_made)
         file_tbl(cx, rsrc_class.*table.ref);
-    append_record(cx, &cx.rsrc_class_tbl, rsrc_class);
-    ++cx.rsrc_class_count;
+    append_record(cx, &cx.sections.rsrc_class_tbl, rsrc_class);
+    ++cx.sections.rsrc_class_count;
     rsrc_class.rc_cb_ID = 0;
 }

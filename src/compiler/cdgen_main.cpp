@@ -2,6 +2,8 @@
 
 #include "compiler/cdgen.h"
 
+#include "compiler/cdgen_process.h"
+
 int main(int argc, char **argv) {
     take_process();
     return cdgen_main(argc, argv);

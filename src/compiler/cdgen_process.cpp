@@ -1,11 +1,14 @@
 /* cdgen_process.cpp: how a process that is the compiler alone meets signals and the end of memory. */
 
-#include "compiler/cdgen.h"
+#include "compiler/cdgen_process.h"
+
+#include "language/messages.h"
 
 #include <atomic>
 #include <cerrno>
 #include <csignal>
 #include <cstdio>
+#include <cstring>
 #include <exception>
 #include <unistd.h>
 

@@ -2,6 +2,8 @@
 
 #include "compiler/cdgen_read.h"
 
+#include "compiler/above_stdio.h"
+#include "compiler/cdgen.h"
 #include "compiler/cdgen_stanzas.h"
 
 #include <algorithm>
@@ -21,7 +23,7 @@ char *next_mark(char *from) {
 
 /* Copies up to `room` bytes of the source; 0 at its end. */
 size_t read_some(cdgen &cx, char *to, size_t room) {
-    source_file &source = cx.cdb_fp;
+    source_file &source = cx.source.cdb_fp;
     if (source.fd < 0) {
         size_t copied = source.memory.copy(to, room);
         source.memory.remove_prefix(copied);
@@ -33,14 +35,14 @@ size_t read_some(cdgen &cx, char *to, size_t room) {
     while (n < 0 && errno == EINTR);
     if (n < 0) {
         int error = errno;
-        cdgen_error_exit(MSG_CANNOT_READ, cx.cdefsrc, strerror(error), 0, error);
+        cdgen_error_exit(MSG_CANNOT_READ, cx.options.cdefsrc, strerror(error), 0, error);
     }
     return static_cast<size_t>(n);
 }
 
 /* Moves a line's beginning to the front of the buffer and reads what follows; false at the end of the source. */
 bool refill(cdgen &cx) {
-    source_file &source = cx.cdb_fp;
+    source_file &source = cx.source.cdb_fp;
     size_t begun = source.end - source.pos;
     memmove(source.buffer.data(), source.buffer.data() + source.pos, begun);
     size_t n = read_some(cx, source.buffer.data() + begun, SOURCE_BUFFER - begun);
@@ -59,15 +61,15 @@ source_line whole_line(source_file &source, char *begin, char *newline) {
 }
 
 source_line cut_line(cdgen &cx, const char *begin, size_t length) {
-    cx.cdb_fp.pos += length;
-    memcpy(cx.inbuf, begin, length);
-    cx.inbuf[length] = '\0';
-    cx.cdb_fp.cut_mark = next_mark(cx.inbuf);
-    return {cx.inbuf, cx.inbuf + length, cx.cdb_fp.cut_mark};
+    cx.source.cdb_fp.pos += length;
+    memcpy(cx.source.inbuf, begin, length);
+    cx.source.inbuf[length] = '\0';
+    cx.source.cdb_fp.cut_mark = next_mark(cx.source.inbuf);
+    return {cx.source.inbuf, cx.source.inbuf + length, cx.source.cdb_fp.cut_mark};
 }
 
 source_line some_line(cdgen &cx) {
-    source_file &source = cx.cdb_fp;
+    source_file &source = cx.source.cdb_fp;
     for (;;) {
         char *begin = source.buffer.data() + source.pos;
         size_t there = std::min(LINE_MAX_CHARS, source.end - source.pos);
@@ -105,16 +107,17 @@ char *end_by_marks(const source_line &line, char *p) {
 }
 
 bool class_is_open(const cdgen &cx) {
-    return cx.cb_rsrc_class.rc_cb_ID != 0;
+    return cx.staged.cb_rsrc_class.rc_cb_ID != 0;
 }
 
 /* What refers to the SD section of a class or action run. An open class action goes before the resource action. */
 cdb_ref_t *owner_field(cdgen &cx, const sd_owner &owner) {
     if (owner.of_class != nullptr)
-        return &(cx.cb_rsrc_class.*owner.of_class);
+        return &(cx.staged.cb_rsrc_class.*owner.of_class);
     if (owner.of_action == nullptr)
         return nullptr;
-    rsrc_action_t &action = cx.cb_rsrc_actionC.ac_cb_ID != 0 ? cx.cb_rsrc_actionC : cx.cb_rsrc_action;
+    rsrc_action_t &action =
+        cx.staged.cb_rsrc_actionC.ac_cb_ID != 0 ? cx.staged.cb_rsrc_actionC : cx.staged.cb_rsrc_action;
     return &(action.*owner.of_action);
 }
 
@@ -122,76 +125,71 @@ cdb_ref_t *owner_field(cdgen &cx, const sd_owner &owner) {
 void begin_sd_run(cdgen &cx, bool of_attribute) {
     if (!of_attribute && !class_is_open(cx))
         source_error(cx, MSG_NO_CLASS_FOR_SD);
-    if (cx.curr_sd_tbl == nullptr)
-        cx.curr_sd_tbl = owner_field(cx, *cx.scp->sc_sd_owner);
-    if (cx.curr_sd_tbl != nullptr) {
-        cx.curr_sd_tbl->offset[0] = mk_sd_sec(cx);
-        cx.sd_num_elems = 0;
-    }
-    if (of_attribute && cx.attr_dflt_val == nullptr)
+    if (cx.sd.curr_sd_tbl == nullptr)
+        cx.sd.curr_sd_tbl = owner_field(cx, *cx.framing.scp->sc_sd_owner);
+    if (cx.sd.curr_sd_tbl != nullptr)
+        cx.sd.begin(mk_sd_sec(cx));
+    if (of_attribute && cx.sd.attr_dflt_val == nullptr)
         source_error(cx, MSG_NO_SD_ATTRIBUTE);
 }
 
 stanza_state &state_of(cdgen &cx, const srtable_ctrl *scp) {
-    return cx.stanzas[static_cast<size_t>(scp - sc_tables.data())];
+    return cx.framing.stanzas[static_cast<size_t>(scp - sc_tables.data())];
 }
 
 /* The values of the stanza before have been used. */
 void forget_values(cdgen &cx, dflt_tbl &dflt) {
     if (dflt.tbl.use_count() == 1)
-        cx.spare_dflt = std::move(dflt.tbl);
+        cx.framing.spare_dflt = std::move(dflt.tbl);
     dflt = {};
 }
 
 void begin_sd_stanza(cdgen &cx) {
-    bool of_attribute = is_attr_SD(cx.table_id) != nullptr;
-    stanza_state &state = state_of(cx, cx.scp);
-    if (cx.cb_sd_def.sd_cb_ID != 0 && cx.prev_scp != cx.scp) {
-        cmplt_sd_tbl(cx, cx.prev_scp);
+    bool of_attribute = is_attr_SD(cx.framing.table_id) != nullptr;
+    stanza_state &state = state_of(cx, cx.framing.scp);
+    if (cx.staged.cb_sd_def.sd_cb_ID != 0 && cx.framing.prev_scp != cx.framing.scp) {
+        cmplt_sd_tbl(cx, cx.framing.prev_scp);
         if (!of_attribute)
-            cx.curr_sd_tbl = nullptr;
+            cx.sd.curr_sd_tbl = nullptr;
     }
-    if (of_attribute && cx.attr_dflt_val != nullptr)
-        state.dflt = state_of(cx, cx.prev_scp).dflt;
-    if (!of_attribute) { /* an attribute that came before keeps what its own run gave it */
-        cx.attr_dflt_val = nullptr;
-        cx.max_sd_idx = nullptr;
-        if (cx.cb_sd_def.sd_cb_ID == 0)
-            cx.curr_sd_tbl = nullptr;
+    if (of_attribute && cx.sd.attr_dflt_val != nullptr)
+        state.dflt = state_of(cx, cx.framing.prev_scp).dflt;
+    if (!of_attribute) {
+        cx.sd.leave_attribute();
+        if (cx.staged.cb_sd_def.sd_cb_ID == 0)
+            cx.sd.curr_sd_tbl = nullptr;
     }
-    if (cx.cb_sd_def.sd_cb_ID == 0) {
+    if (cx.staged.cb_sd_def.sd_cb_ID == 0) {
         begin_sd_run(cx, of_attribute);
         if (!of_attribute)
             forget_values(cx, state.dflt);
     }
-    sc_init_tbl (*cx.scp)(cx);
+    sc_init_tbl (*cx.framing.scp)(cx);
     state.req_mask = state.opt_mask = 0;
 }
 
 /* Attribute records stay open: their own kind's next stanza, or the end of input, completes them. */
 void begin_plain_stanza(cdgen &cx) {
-    if (cx.cb_sd_def.sd_cb_ID != 0)
-        cmplt_sd_tbl(cx, cx.prev_scp);
-    if (cx.cb_rsrc_action.ac_cb_ID != 0)
+    if (cx.staged.cb_sd_def.sd_cb_ID != 0)
+        cmplt_sd_tbl(cx, cx.framing.prev_scp);
+    if (cx.staged.cb_rsrc_action.ac_cb_ID != 0)
         cmplt_action_tbl(cx);
-    if (cx.cb_rsrc_actionC.ac_cb_ID != 0)
+    if (cx.staged.cb_rsrc_actionC.ac_cb_ID != 0)
         cmplt_actionC_tbl(cx);
-    sc_init_tbl (*cx.scp)(cx);
-    forget_values(cx, cx.state->dflt);
-    cx.state->req_mask = cx.state->opt_mask = 0;
-    cx.attr_dflt_val = nullptr;
-    cx.curr_sd_tbl = nullptr;
-    cx.max_sd_idx = nullptr;
+    sc_init_tbl (*cx.framing.scp)(cx);
+    forget_values(cx, cx.framing.state->dflt);
+    cx.framing.state->req_mask = cx.framing.state->opt_mask = 0;
+    cx.sd.forget_owner();
 }
 
 void begin_stanza(cdgen &cx, const char *name) {
-    cx.table_id = set_table_id(name);
-    if (cx.table_id < 0)
+    cx.framing.table_id = set_table_id(name);
+    if (cx.framing.table_id < 0)
         source_error(cx, MSG_UNKNOWN_STANZA, name);
-    cx.prev_scp = cx.scp;
-    cx.scp = cx.curr_sd_scp = &sc_tables[static_cast<size_t>(cx.table_id)];
-    cx.state = &state_of(cx, cx.scp);
-    if (cx.scp->sc_sd_owner != nullptr)
+    cx.framing.prev_scp = cx.framing.scp;
+    cx.framing.scp = cx.framing.curr_sd_scp = &sc_tables[static_cast<size_t>(cx.framing.table_id)];
+    cx.framing.state = &state_of(cx, cx.framing.scp);
+    if (cx.framing.scp->sc_sd_owner != nullptr)
         begin_sd_stanza(cx);
     else
         begin_plain_stanza(cx);
@@ -205,41 +203,31 @@ void source_file::close() {
     fd = -1;
 }
 
-int above_stdio(int fd) {
-    if (fd < 0 || fd > STDERR_FILENO)
-        return fd;
-    int higher = fcntl(fd, F_DUPFD_CLOEXEC, STDERR_FILENO + 1);
-    int error = errno;
-    close(fd);
-    errno = error;
-    return higher;
-}
-
 void open_source(cdgen &cx, const char *filename) {
     take_source(cx, filename, above_stdio(open(filename, O_RDONLY | O_CLOEXEC)));
 }
 
 void take_source(cdgen &cx, const char *filename, int fd) {
-    source_file &source = cx.cdb_fp;
+    source_file &source = cx.source.cdb_fp;
     source.fd = fd;
     struct stat st = {};
     if (source.fd < 0 || fstat(source.fd, &st) != 0)
         cdgen_error_exit(MSG_CANNOT_OPEN, filename, strerror(errno), 0, errno);
     source.device = st.st_dev;
     source.inode = st.st_ino;
-    cx.table_id = -1;
+    cx.framing.table_id = -1;
 }
 
 void take_source(cdgen &cx, std::string_view bytes) {
-    cx.cdb_fp.close();
-    cx.cdb_fp.memory = bytes;
-    cx.table_id = -1;
+    cx.source.cdb_fp.close();
+    cx.source.cdb_fp.memory = bytes;
+    cx.framing.table_id = -1;
 }
 
 source_line next_line(cdgen &cx) {
     source_line line = some_line(cx);
-    if (line.begin != nullptr && cx.linenum < std::numeric_limits<int>::max())
-        ++cx.linenum;
+    if (line.begin != nullptr && cx.source.linenum < std::numeric_limits<int>::max())
+        ++cx.source.linenum;
     return line;
 }
 
@@ -259,10 +247,10 @@ attr_text text_of(const source_line &line) {
 void take_line(cdgen &cx, const attr_text &text) {
     if (text.name == text.line)
         begin_stanza(cx, text.name);
-    else if (cx.table_id < 0)
+    else if (cx.framing.table_id < 0)
         source_error(cx, MSG_NO_STANZA);
     else
-        save_attr_line(cx, text, static_cast<stanza_id>(cx.table_id));
+        save_attr_line(cx, text, static_cast<stanza_id>(cx.framing.table_id));
 }
 
 namespace {
@@ -282,7 +270,7 @@ struct closing {
 } // namespace
 
 void cache_input_data(cdgen &cx, const char *filename) {
-    closing at_end(cx.cdb_fp);
+    closing at_end(cx.source.cdb_fp);
     open_source(cx, filename);
     for (;;) {
         source_line line = next_line(cx);

@@ -2,24 +2,26 @@
 
 #include "compiler/cdgen_stanzas.h"
 
+#include "compiler/cdgen_kinds.h"
+
 namespace {
 
 template <auto Record> char *record(cdgen &cx) {
-    return reinterpret_cast<char *>(&(cx.*Record));
+    return reinterpret_cast<char *>(&(cx.staged.*Record));
 }
 
 /* By staged_record. */
 constexpr char *(*records[STAGED_COUNT])(cdgen &) = {
-    record<&cdgen::cb_rsrc_class>,          /* STAGED_CLASS */
-    record<&cdgen::cb_rsrc_cmmap>,          /* STAGED_CMMAP */
-    record<&cdgen::cb_rsrc_variable_class>, /* STAGED_VARIABLE_CLASS */
-    record<&cdgen::cb_rsrc_pattr>,          /* STAGED_PATTR */
-    record<&cdgen::cb_rsrc_pattrC>,         /* STAGED_PATTR_C */
-    record<&cdgen::cb_rsrc_dattr>,          /* STAGED_DATTR */
-    record<&cdgen::cb_rsrc_dattrC>,         /* STAGED_DATTR_C */
-    record<&cdgen::cb_rsrc_action>,         /* STAGED_ACTION */
-    record<&cdgen::cb_rsrc_actionC>,        /* STAGED_ACTION_C */
-    record<&cdgen::cb_sd_def>,              /* STAGED_SD_DEF */
+    record<&staging_records::cb_rsrc_class>,          /* STAGED_CLASS */
+    record<&staging_records::cb_rsrc_cmmap>,          /* STAGED_CMMAP */
+    record<&staging_records::cb_rsrc_variable_class>, /* STAGED_VARIABLE_CLASS */
+    record<&staging_records::cb_rsrc_pattr>,          /* STAGED_PATTR */
+    record<&staging_records::cb_rsrc_pattrC>,         /* STAGED_PATTR_C */
+    record<&staging_records::cb_rsrc_dattr>,          /* STAGED_DATTR */
+    record<&staging_records::cb_rsrc_dattrC>,         /* STAGED_DATTR_C */
+    record<&staging_records::cb_rsrc_action>,         /* STAGED_ACTION */
+    record<&staging_records::cb_rsrc_actionC>,        /* STAGED_ACTION_C */
+    record<&staging_records::cb_sd_def>,              /* STAGED_SD_DEF */
 };
 
 /* By stanza_id. */
@@ -51,35 +53,31 @@ void (*sc_init_tbl(const srtable_ctrl &kind))(cdgen &) {
 tbl *sc_str_tbl(cdgen &cx, const srtable_ctrl &kind) {
     switch (kind.sc_side_tables) {
     case TABLES_OF_CMMAP:
-        return staged_tbl(cx.cb_rsrc_cmmap.u_rcm_strings);
+        return staged_tbl(cx.staged.cb_rsrc_cmmap.u_rcm_strings);
     case TABLES_OF_VARIABLE_CLASS:
-        return staged_tbl(cx.cb_rsrc_variable_class.u_rvc_string_tbl);
+        return staged_tbl(cx.staged.cb_rsrc_variable_class.u_rvc_string_tbl);
     default:
-        return staged_tbl(cx.cb_rsrc_class.u_rc_strings);
+        return staged_tbl(cx.staged.cb_rsrc_class.u_rc_strings);
     }
 }
 
 tbl *sc_vty_tbl(cdgen &cx, const srtable_ctrl &kind) {
-    return kind.sc_side_tables == TABLES_OF_CLASS ? staged_tbl(cx.cb_rsrc_class.u_rc_variety_lists) : nullptr;
+    return kind.sc_side_tables == TABLES_OF_CLASS ? staged_tbl(cx.staged.cb_rsrc_class.u_rc_variety_lists) : nullptr;
 }
 
 tbl *sc_vv_tbl(cdgen &cx, const srtable_ctrl &kind) {
-    return kind.sc_side_tables == TABLES_OF_CLASS ? staged_tbl(cx.cb_rsrc_class.u_rc_valid_vals) : nullptr;
-}
-
-tbl *sc_sd_tbl(cdgen &cx, const srtable_ctrl &kind) {
-    return kind.sc_side_tables == TABLES_OF_CMMAP ? nullptr : staged_tbl(cx.cb_rsrc_class.u_rc_sd_defs);
+    return kind.sc_side_tables == TABLES_OF_CLASS ? staged_tbl(cx.staged.cb_rsrc_class.u_rc_valid_vals) : nullptr;
 }
 
 vx_uint16_t &vv_found(cdgen &cx, const srtable_ctrl &kind) {
     switch (kind.sc_record) {
     case STAGED_PATTR:
-        return cx.pattr_vv_found;
+        return cx.valid_values.pattr_vv_found;
     case STAGED_PATTR_C:
-        return cx.pattrC_vv_found;
+        return cx.valid_values.pattrC_vv_found;
     case STAGED_DATTR:
-        return cx.dattr_vv_found;
+        return cx.valid_values.dattr_vv_found;
     default:
-        return cx.dattrC_vv_found;
+        return cx.valid_values.dattrC_vv_found;
     }
 }

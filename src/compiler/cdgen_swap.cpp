@@ -3,7 +3,7 @@
 #include "compiler/cdgen_swap.h"
 
 #include "cdb_fields.h"
-#include "compiler/cdgen.h"
+#include "format/checksum.h"
 #include "format/sections.h"
 
 #include <algorithm>

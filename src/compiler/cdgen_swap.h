@@ -6,7 +6,12 @@
 #include "cdb.h"
 
 #include <cstddef>
+#include <span>
 #include <vector>
+
+/* Reverses the byte order of a finished image in place. nowhere: places in the image of words that look like references
+ * and are not; they are reversed, but not followed. */
+void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere = {});
 
 /* A table that references lead into. Hands out each thing in it once, and only what lies inside. */
 class swap_area {

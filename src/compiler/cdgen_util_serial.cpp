@@ -1,6 +1,8 @@
 /* cdgen_util_serial.cpp: typed values into cells and string tables. */
 
-#include "compiler/cdgen.h"
+#include "compiler/cdgen_values.h"
+
+#include "compiler/cdgen_error.h"
 
 namespace {
 

@@ -1,6 +1,8 @@
 /* cdgen_util_tables.cpp: staging tables and memory. */
 
-#include "compiler/cdgen.h"
+#include "compiler/cdgen_tables.h"
+
+#include "compiler/cdgen_context.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -14,6 +16,11 @@
 tbl::~tbl() {
     free(tbl_base);
     free(tbl_spare);
+}
+
+table_store::~table_store() {
+    for (tbl_content &content : filed)
+        free(content.tbl_base);
 }
 
 void tbl::restart(const char *name) {
@@ -32,10 +39,10 @@ void *cfg_malloc(size_t s) {
 }
 
 tbl *make_tbl(cdgen &cx, size_t au, const char *name) {
-    if (cx.spare_tables.empty())
-        return &cx.tables.emplace_back(au, name);
-    tbl *spare = cx.spare_tables.back();
-    cx.spare_tables.pop_back();
+    if (cx.store.spare_tables.empty())
+        return &cx.store.tables.emplace_back(au, name);
+    tbl *spare = cx.store.spare_tables.back();
+    cx.store.spare_tables.pop_back();
     std::destroy_at(spare);
     return std::construct_at(spare, au, name);
 }
@@ -78,14 +85,14 @@ void first_block(cdgen &cx, tbl &t) {
     t.tbl_base = t.tbl_prev_base = t.tbl_next = block;
     t.tbl_size = t.tbl_au;
     t.tbl_end = block + t.tbl_size;
-    if (cx.debugLevel > 2)
+    if (cx.options.debugLevel > 2)
         printf("alloc_tble: %s, table size: %d\n", t.tbl_name, static_cast<int>(t.tbl_size));
 }
 
 void grow(cdgen &cx, tbl &t, size_t s) {
     size_t used = t.used();
     size_t chunk = growth_chunk(t, s);
-    if (cx.debugLevel > 2)
+    if (cx.options.debugLevel > 2)
         fprintf(stderr, "alloc_tble: overflow by %d b. Adding %d b to %s\n", static_cast<int>(s),
                 static_cast<int>(chunk), t.tbl_name);
     t.tbl_prev_base = t.tbl_base;
@@ -100,12 +107,12 @@ void grow(cdgen &cx, tbl &t, size_t s) {
     t.tbl_size = size;
     t.tbl_end = t.tbl_base + size;
     memset(t.tbl_next, 0, size - used);
-    if (cx.debugLevel > 2)
+    if (cx.options.debugLevel > 2)
         printf("alloc_tble: %s, new table size: %d\n", t.tbl_name, static_cast<int>(t.tbl_size));
 }
 
 [[gnu::noinline]] void make_room(cdgen &cx, tbl &t, size_t s) {
-    if (cx.debugLevel > 2)
+    if (cx.options.debugLevel > 2)
         printf("alloc_tble: %s, structure size: %d\n", t.tbl_name, static_cast<int>(s));
     if (t.tbl_base == nullptr)
         first_block(cx, t);
@@ -116,7 +123,8 @@ void grow(cdgen &cx, tbl &t, size_t s) {
 } // namespace
 
 void *alloc_tble(cdgen &cx, tbl *t, size_t s) {
-    if (s >= t->room() || cx.debugLevel > 2) /* reaching the end exactly grows too; without a block there is no room */
+    if (s >= t->room() ||
+        cx.options.debugLevel > 2) /* reaching the end exactly grows too; without a block there is no room */
         make_room(cx, *t, s);
     char *reserved = t->tbl_next;
     t->tbl_next += s;
@@ -143,13 +151,6 @@ vx_uint32_t save_tbl_val_round(cdgen &cx, tbl *tp, const void *val, size_t len) 
 
 vx_uint32_t add_to_tbl(cdgen &cx, tbl *tp, const void *data, size_t len) {
     return save_tbl_val_round(cx, tp, data, len);
-}
-
-void memcpy_8_rounded(char *dst, const char *src, int len) {
-    int rounded = (len + 7) & ~7;
-    memcpy(dst, src, static_cast<size_t>(len));
-    if (rounded > len)
-        memset(dst + len, 0, static_cast<size_t>(rounded - len));
 }
 
 void *tbl_at(tbl_content *t, size_t offset, size_t size) {
@@ -208,7 +209,7 @@ namespace {
 constexpr size_t SMALL = 256; /* bytes: a block for as little would take half as much again */
 
 tbl_content *keep_copy(cdgen &cx, const tbl &t) {
-    char *content = cx.filed_small.take(sizeof(tbl_content) + t.used());
+    char *content = cx.store.filed_small.take(sizeof(tbl_content) + t.used());
     if (content == nullptr)
         table_failure(t, MSG_NO_MEMORY_FOR_TABLE);
     char *bytes = content + sizeof(tbl_content);
@@ -218,7 +219,7 @@ tbl_content *keep_copy(cdgen &cx, const tbl &t) {
 
 tbl_content *keep_block(cdgen &cx, tbl &t) {
     trim_tbl(&t);
-    tbl_content *kept = &cx.filed.emplace_back(t);
+    tbl_content *kept = &cx.store.filed.emplace_back(t);
     t.tbl_base = t.tbl_next = nullptr;
     return kept;
 }
@@ -231,5 +232,5 @@ void file_tbl(cdgen &cx, cdb_ref_t &ref) {
         stage_tbl(ref, nullptr);
     else
         stage_tbl(ref, open->used() <= SMALL ? keep_copy(cx, *open) : keep_block(cx, *open));
-    cx.spare_tables.push_back(open);
+    cx.store.spare_tables.push_back(open);
 }

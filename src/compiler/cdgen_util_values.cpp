@@ -1,6 +1,9 @@
 /* cdgen_util_values.cpp: data types by name, and from text to values. */
 
-#include "compiler/cdgen.h"
+#include "compiler/cdgen_values.h"
+
+#include "compiler/cdgen_context.h"
+#include "language/name_index.h"
 
 #include <cerrno>
 #include <cfloat>
@@ -240,14 +243,6 @@ int strToVar(const char *s, orb_variable_type_t *t) {
                 return 0;
             }
     return 1;
-}
-
-vx_data_type_t scalar_vx(vx_data_type_t dt) {
-    return is_vx_array(dt) ? static_cast<vx_data_type_t>(dt - VX_INT32_ARRAY + VX_INT32) : dt;
-}
-
-int is_vx_array(vx_data_type_t dt) {
-    return static_cast<unsigned>(dt) - VX_INT32_ARRAY < 10;
 }
 
 long int_from_text(cdgen &cx, const char *text, char **end, int base) {

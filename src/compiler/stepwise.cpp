@@ -3,6 +3,7 @@
 #include "compiler/stepwise.h"
 
 #include "compiler/cdgen_closing.h"
+#include "compiler/cdgen_kinds.h"
 #include "compiler/cdgen_stanzas.h"
 
 #include <tuple>
@@ -21,20 +22,20 @@ const char *record_of(const cdgen &cx, const srtable_ctrl &row) {
 } // namespace
 
 stepwise_compiler::stepwise_compiler(const char *source, const char *output, line_observer &observer) {
-    cx.observer = &observer;
-    cx.explanations = nullptr;
-    cx.cdefsrc = source;
-    cx.cdefname = output;
+    cx.options.observer = &observer;
+    cx.options.explanations = nullptr;
+    cx.options.cdefsrc = source;
+    cx.options.cdefname = output;
 }
 
 /* ---- Steps ----------------------------------------------------------------------------------------------------- */
 
 void stepwise_compiler::open() {
-    open_source(cx, cx.cdefsrc);
+    open_source(cx, cx.options.cdefsrc);
 }
 
 void stepwise_compiler::open(int fd) {
-    take_source(cx, cx.cdefsrc, fd);
+    take_source(cx, cx.options.cdefsrc, fd);
 }
 
 void stepwise_compiler::open_bytes(std::string_view bytes) {
@@ -46,15 +47,17 @@ source_line stepwise_compiler::next_line() {
 }
 
 void stepwise_compiler::close() {
-    cx.cdb_fp.close();
+    cx.source.cdb_fp.close();
 }
 
 void stepwise_compiler::take_line(const attr_text &text) {
-    auto before = std::tuple(cx.scp, cx.prev_scp, cx.curr_sd_scp, cx.state, cx.table_id);
+    auto before =
+        std::tuple(cx.framing.scp, cx.framing.prev_scp, cx.framing.curr_sd_scp, cx.framing.state, cx.framing.table_id);
     try {
         ::take_line(cx, text);
     } catch (const fatal_exit &) {
-        std::tie(cx.scp, cx.prev_scp, cx.curr_sd_scp, cx.state, cx.table_id) = before;
+        std::tie(cx.framing.scp, cx.framing.prev_scp, cx.framing.curr_sd_scp, cx.framing.state, cx.framing.table_id) =
+            before;
         throw;
     }
 }
@@ -80,13 +83,13 @@ bool stepwise_compiler::is_open(int kind) const {
 }
 
 int stepwise_compiler::previous_kind() const {
-    return cx.prev_scp == nullptr ? -1 : static_cast<int>(cx.prev_scp - sc_tables.data());
+    return cx.framing.prev_scp == nullptr ? -1 : static_cast<int>(cx.framing.prev_scp - sc_tables.data());
 }
 
 vx_data_type_t stepwise_compiler::data_type() const {
     vx_data_type_t type = VX_UNKNOWN;
-    if (cx.scp->dt_offset >= 0)
-        memcpy(&type, record_of(cx, *cx.scp) + cx.scp->dt_offset, sizeof type);
+    if (cx.framing.scp->dt_offset >= 0)
+        memcpy(&type, record_of(cx, *cx.framing.scp) + cx.framing.scp->dt_offset, sizeof type);
     return type;
 }
 
@@ -105,33 +108,26 @@ void stepwise_compiler::drop_record(int kind) {
 }
 
 void stepwise_compiler::complete_element() {
-    cx.sd_name_found = cx.sd_desc_found = cx.sd_disp_found = cx.sd_dt_found = 1;
+    cx.sd.element.complete();
 }
 
 void stepwise_compiler::give_up_run() {
-    cx.cb_sd_def.sd_cb_ID = 0;
-    cx.attr_dflt_val = nullptr;
-    cx.curr_sd_tbl = nullptr;
-    cx.max_sd_idx = nullptr;
-    cx.curr_sdeli = -1;
-    cx.expected_sdeli = 0;
+    cx.staged.cb_sd_def.sd_cb_ID = 0;
+    cx.sd.give_up();
 }
 
 void stepwise_compiler::begin_run_of_nobody(int kind) {
-    cx.attr_dflt_val = nullptr;
-    cx.max_sd_idx = nullptr;
-    cx.curr_sd_tbl = &nobody;
-    nobody.offset[0] = mk_sd_sec(cx);
-    cx.scp = cx.curr_sd_scp = &row_of(kind);
-    cx.state = &cx.stanzas[static_cast<size_t>(kind)];
-    cx.table_id = kind;
-    sc_init_tbl (*cx.scp)(cx);
-    cx.state->req_mask = cx.state->opt_mask = 0;
-    cx.state->dflt = {};
+    cx.sd.begin_for(nobody, mk_sd_sec(cx));
+    cx.framing.scp = cx.framing.curr_sd_scp = &row_of(kind);
+    cx.framing.state = &cx.framing.stanzas[static_cast<size_t>(kind)];
+    cx.framing.table_id = kind;
+    sc_init_tbl (*cx.framing.scp)(cx);
+    cx.framing.state->req_mask = cx.framing.state->opt_mask = 0;
+    cx.framing.state->dflt = {};
 }
 
 void stepwise_compiler::expect_index(int index) {
-    cx.expected_sdeli = index;
+    cx.sd.expected_sdeli = index;
 }
 
 void stepwise_compiler::forget_overflow() {

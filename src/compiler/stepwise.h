@@ -33,40 +33,40 @@ public:
     /* ---- State ---- */
 
     int line_number() const {
-        return cx.linenum;
+        return cx.source.linenum;
     }
 
     /* Whether a record of the kind is open. The kinds of structured data share one. */
     bool is_open(int kind) const;
     bool run_is_open() const {
-        return cx.cb_sd_def.sd_cb_ID != 0;
+        return cx.staged.cb_sd_def.sd_cb_ID != 0;
     }
     bool class_is_open() const {
-        return cx.cb_rsrc_class.rc_cb_ID != 0;
+        return cx.staged.cb_rsrc_class.rc_cb_ID != 0;
     }
     /* The kind of the stanza before the current one; -1: none. */
     int previous_kind() const;
     /* The required attributes that a kind's latest stanza has given. */
     vx_uint32_t required_seen(int kind) const {
-        return cx.stanzas[static_cast<size_t>(kind)].req_mask;
+        return cx.framing.stanzas[static_cast<size_t>(kind)].req_mask;
     }
     /* The data type that the current stanza has given; unknown if its kind takes none. */
     vx_data_type_t data_type() const;
 
     /* The index of the run's latest element, and the one that the next element must have. */
     int element_index() const {
-        return cx.curr_sdeli;
+        return cx.sd.curr_sdeli;
     }
     int expected_index() const {
-        return cx.expected_sdeli;
+        return cx.sd.expected_sdeli;
     }
     /* Whether the elements that follow, or that are open, make the value of an attribute. */
     bool run_makes_value() const {
-        return cx.attr_dflt_val != nullptr;
+        return cx.sd.attr_dflt_val != nullptr;
     }
     /* Whether the run's highest index is stored. */
     bool run_has_highest_index() const {
-        return cx.max_sd_idx != nullptr;
+        return cx.sd.max_sd_idx != nullptr;
     }
     /* errno as the number conversions see it. */
     int conversion_errno() const {

@@ -246,15 +246,6 @@ const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name) {
                                                                                                         : nullptr;
 }
 
-const char *is_SD_stanza(int table_id) {
-    return std::strstr(sc_tables[static_cast<std::size_t>(table_id)].sc_name, "SDDefinition");
-}
-
 const char *is_attr_SD(int table_id) {
     return std::strstr(sc_tables[static_cast<std::size_t>(table_id)].sc_name, "AttrSDDefinition");
-}
-
-sd_type_t SD_stanza_type(int table_id) {
-    const sd_owner *owner = sc_tables[static_cast<std::size_t>(table_id)].sc_sd_owner;
-    return owner == nullptr ? SD_TYPE_UNKNOWN : owner->type;
 }

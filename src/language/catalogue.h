@@ -151,9 +151,7 @@ extern const std::array<srtable_ctrl, SC_COUNT + 1> sc_tables;
 int set_table_id(const char *name);
 /* A kind's attribute by its exact name, or null. */
 const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name);
-/* Non-null when the kind's name says that it defines structured data; that of an attribute. */
-const char *is_SD_stanza(int table_id);
+/* Non-null when the kind's name says that it defines structured data of an attribute. */
 const char *is_attr_SD(int table_id);
-sd_type_t SD_stanza_type(int table_id);
 
 #endif

@@ -1,6 +1,7 @@
 /* runs.cpp: warnings about runs of elements and what they belong to. */
 
 #include "check/warnings/watcher.h"
+#include "format/data_types.h"
 
 #include <utility>
 

@@ -1,6 +1,7 @@
 /* values.cpp: warnings about single values that mean less than they say. */
 
 #include "check/warnings/watcher.h"
+#include "format/names.h"
 
 #include <algorithm>
 #include <iterator>

@@ -11,7 +11,7 @@ using namespace from_source;
 
 /* With a class whose name can be looked at. */
 std::string class_name(opened &c) {
-    return c.string_at(c.cx.cb_rsrc_class.u_rc_name.offset[0]);
+    return c.string_at(c.cx.staged.cb_rsrc_class.u_rc_name.offset[0]);
 }
 
 /* ---- Name and value -------------------------------------------------------------------------------------------- */
@@ -38,19 +38,19 @@ TEST(AttributeLine, LineOfBlanksIsNothing) {
     for (const char *line : {"", " ", "\t", " \t "}) {
         opened c;
         EXPECT_EQ(c.feeding(SC_RESOURCE_CLASS, line), WELL);
-        EXPECT_EQ(c.cx.linepos, 1 + static_cast<int>(strlen(line)));
+        EXPECT_EQ(c.cx.source.linepos, 1 + static_cast<int>(strlen(line)));
     }
 }
 
 TEST(AttributeLine, TwoQuotesAreNoValueAndTheNameIsNotLookedAt) {
     for (const char *line : {"\tName=\"\"", "\tDescription=\"\"", "\tNonsense=\"\"", "\t=\"\""}) {
         opened c;
-        vx_uint32_t name = c.cx.cb_rsrc_class.u_rc_name.offset[0];
+        vx_uint32_t name = c.cx.staged.cb_rsrc_class.u_rc_name.offset[0];
         EXPECT_EQ(c.feeding(SC_RESOURCE_CLASS, line), WELL) << line;
         EXPECT_EQ(c.state(SC_RESOURCE_CLASS).req_mask, 0U);
         EXPECT_EQ(c.state(SC_RESOURCE_CLASS).opt_mask, 0U);
-        EXPECT_EQ(c.cx.cb_rsrc_class.u_rc_name.offset[0], name);
-        EXPECT_EQ(c.cx.cb_rsrc_class.rc_dscr_msgid, 0U);
+        EXPECT_EQ(c.cx.staged.cb_rsrc_class.u_rc_name.offset[0], name);
+        EXPECT_EQ(c.cx.staged.cb_rsrc_class.rc_dscr_msgid, 0U);
     }
 }
 
@@ -62,7 +62,7 @@ TEST(AttributeLine, ColumnIsTheValues) {
     for (const auto &[line, column] : rows) {
         opened c;
         EXPECT_EQ(c.feeding(SC_RESOURCE_CLASS, line), WELL) << line;
-        EXPECT_EQ(c.cx.linepos, column) << line;
+        EXPECT_EQ(c.cx.source.linepos, column) << line;
     }
 }
 
@@ -122,7 +122,7 @@ TEST(AttributeLine, EmptyValueIsMissing) {
 
 TEST(AttributeLine, MissingValueShowsTheSourceOnStandardOutput) {
     opened c;
-    c.cx.cdefsrc = "some/source.txt";
+    c.cx.options.cdefsrc = "some/source.txt";
     EXPECT_EQ(output_of([&] { c.feed(SC_RESOURCE_CLASS, "\tDescription="); }), "In file some/source.txt: ");
     EXPECT_EQ(output_of([&] { c.feed(SC_RESOURCE_CLASS, "\tNonsense="); }), "");
 }
@@ -138,7 +138,7 @@ TEST(AttributeLine, LongestValueHas1797Characters) {
         EXPECT_EQ(c.feeding(SC_RESOURCE_CLASS, "\tName=" + fits), WELL);
         EXPECT_EQ(class_name(c), longest);
         EXPECT_EQ(c.feeding(SC_RESOURCE_CLASS, "\tLocator=" + fits), WELL);
-        EXPECT_EQ(c.cx._rc_locator.name, longest);
+        EXPECT_EQ(c.cx.later._rc_locator.name, longest);
         for (const char *name : {"Locator", "Name", "Description"})
             EXPECT_EQ(c.feeding(SC_RESOURCE_CLASS, std::string("\t").append(name).append("=").append(too_long)),
                       (ending{TOO_LONG + name, LINE, 1}));
@@ -323,16 +323,16 @@ TEST(AttributeOrder, RefusedLineStoresNothing) {
     opened c;
     c.feed(SC_RESOURCE_CLASS, "\tDescription=5");
     EXPECT_NE(c.feeding(SC_RESOURCE_CLASS, "\tDescription=6"), WELL);
-    EXPECT_EQ(c.cx.cb_rsrc_class.rc_dscr_msgid, 5U);
+    EXPECT_EQ(c.cx.staged.cb_rsrc_class.rc_dscr_msgid, 5U);
     EXPECT_NE(c.feeding(SC_RESOURCE_CLASS, "\tName=x"), WELL);
-    EXPECT_TRUE(is_absent(c.cx.cb_rsrc_class.u_rc_name));
+    EXPECT_TRUE(is_absent(c.cx.staged.cb_rsrc_class.u_rc_name));
 }
 
 /* ---- Traces ---------------------------------------------------------------------------------------------------- */
 
 TEST(AttributeTrace, LevelTwoShowsTheLineAndTheMask) {
     opened c;
-    c.cx.debugLevel = 2;
+    c.cx.options.debugLevel = 2;
     EXPECT_EQ(output_of([&] { c.feed(SC_RESOURCE_CLASS, "\tDescription=123"); }),
               "ResourceClass: found attr: \"Description\", value: \"123\",length: 3\n"
               "Added 1 to mask, which is now 1\n");
@@ -344,23 +344,23 @@ TEST(AttributeTrace, LevelTwoShowsTheLineAndTheMask) {
 TEST(AttributeTrace, OptionalAttributeShowsNoMask) {
     opened c;
     c.require_nothing(SC_CLASS_ACTION);
-    c.cx.debugLevel = 2;
+    c.cx.options.debugLevel = 2;
     EXPECT_EQ(output_of([&] { c.feed(SC_CLASS_ACTION, "\tTimeOut=5"); }),
               "ClassAction: found attr: \"TimeOut\", value: \"5\",length: 1\n");
 }
 
 TEST(AttributeTrace, LineIsShownBeforeItsOrderIsLookedAt) {
     opened c;
-    c.cx.debugLevel = 3;
+    c.cx.options.debugLevel = 3;
     EXPECT_EQ(output_of([&] { c.feed(SC_RESOURCE_CLASS, "\tLocator=y"); }),
               "ResourceClass: found attr: \"Locator\", value: \"y\",length: 1\n");
 }
 
 TEST(AttributeTrace, LevelOneAndSkippedLinesShowNothing) {
     opened c;
-    c.cx.debugLevel = 1;
+    c.cx.options.debugLevel = 1;
     EXPECT_EQ(output_of([&] { c.feed(SC_RESOURCE_CLASS, "\tDescription=1"); }), "");
-    c.cx.debugLevel = 2;
+    c.cx.options.debugLevel = 2;
     EXPECT_EQ(output_of([&] { c.feed(SC_RESOURCE_CLASS, "\tDisplayName=\"\""); }), "");
 }
 
@@ -374,13 +374,13 @@ struct name_row {
 };
 
 tbl *class_strings(const cdgen &cx) {
-    return staged_tbl(cx.cb_rsrc_class.u_rc_strings);
+    return staged_tbl(cx.staged.cb_rsrc_class.u_rc_strings);
 }
 tbl *map_strings(const cdgen &cx) {
-    return staged_tbl(cx.cb_rsrc_cmmap.u_rcm_strings);
+    return staged_tbl(cx.staged.cb_rsrc_cmmap.u_rcm_strings);
 }
 tbl *variable_class_strings(const cdgen &cx) {
-    return staged_tbl(cx.cb_rsrc_variable_class.u_rvc_string_tbl);
+    return staged_tbl(cx.staged.cb_rsrc_variable_class.u_rvc_string_tbl);
 }
 
 TEST(Name, StandsInItsKindsStringTable) {
@@ -417,7 +417,7 @@ TEST(Name, NeedsAStringTable) {
                               {SC_DYNAMIC_CLASS_ATTRIBUTE, "Expression=x"},
                               {SC_RESET_SD_DEFINITION, "ElementName=x"}}) {
         opened c;
-        c.cx.cb_rsrc_class = {};
+        c.cx.staged.cb_rsrc_class = {};
         EXPECT_EQ(fed(c, kind, line), (ending{"No tbl for strings table", LINE, 1})) << line;
     }
 }
@@ -432,7 +432,7 @@ TEST(AttributeLine, TypeWithoutAHandlerIsUnknown) {
         const attr_line line = {c.cx,
                                 sc_tables[SC_RESOURCE_CLASS],
                                 c.state(SC_RESOURCE_CLASS),
-                                reinterpret_cast<char *>(&c.cx.cb_rsrc_class),
+                                reinterpret_cast<char *>(&c.cx.staged.cb_rsrc_class),
                                 attr,
                                 value};
         EXPECT_EQ(ending_of([&] { store_value(line); }), (ending{"Unknown attribute", LINE, 1})) << type;

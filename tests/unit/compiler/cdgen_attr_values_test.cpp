@@ -112,9 +112,9 @@ TEST(PlainValue, IntegerMayBeOctalOrHexadecimalAndLosesWhatDoesNotFit) {
     for (const integer_row &row : INTEGERS) {
         opened c;
         EXPECT_EQ(fed(c, SC_PERSISTENT_CLASS_ATTRIBUTE, "Description=" + row.text), WELL);
-        EXPECT_EQ(c.cx.cb_rsrc_pattrC.ra_dscr_msgid, row.as16) << row.text;
+        EXPECT_EQ(c.cx.staged.cb_rsrc_pattrC.ra_dscr_msgid, row.as16) << row.text;
         EXPECT_EQ(fed(c, SC_PERSISTENT_CLASS_ATTRIBUTE, "Id=" + row.text), WELL);
-        EXPECT_EQ(static_cast<vx_uint32_t>(c.cx.cb_rsrc_pattrC.ra_attr_id), row.as32) << row.text;
+        EXPECT_EQ(static_cast<vx_uint32_t>(c.cx.staged.cb_rsrc_pattrC.ra_attr_id), row.as32) << row.text;
     }
 }
 
@@ -128,20 +128,20 @@ TEST(PlainValue, UnusedIntegerTypesHaveTheirWidths) {
     *reinterpret_cast<unsigned char *>(&rows[0].expected) = 0x78;
     for (auto [type, expected] : rows) {
         opened c;
-        c.cx.cb_rsrc_class.rc_version = 0xFFFFFFFF;
+        c.cx.staged.cb_rsrc_class.rc_version = 0xFFFFFFFF;
         char value[] = "0x12345678";
         const table_attrs attr = {"Other", type, offsetof(rsrc_class_t, rc_version), 0x1, 0};
         store_value({c.cx, sc_tables[SC_RESOURCE_CLASS], c.state(SC_RESOURCE_CLASS),
-                     reinterpret_cast<char *>(&c.cx.cb_rsrc_class), attr, value});
-        EXPECT_EQ(c.cx.cb_rsrc_class.rc_version, expected) << type;
+                     reinterpret_cast<char *>(&c.cx.staged.cb_rsrc_class), attr, value});
+        EXPECT_EQ(c.cx.staged.cb_rsrc_class.rc_version, expected) << type;
     }
 }
 
 TEST(PlainValue, PropertiesAreAddedToWhatIsThere) {
     opened c;
-    c.cx.cb_rsrc_class.rc_props = 0x80;
+    c.cx.staged.cb_rsrc_class.rc_props = 0x80;
     EXPECT_EQ(fed(c, SC_RESOURCE_CLASS, "Properties=CanDefine,CanDefine"), WELL);
-    EXPECT_EQ(c.cx.cb_rsrc_class.rc_props, 0x88U);
+    EXPECT_EQ(c.cx.staged.cb_rsrc_class.rc_props, 0x88U);
 }
 
 TEST(PlainValue, UnknownPropertyIsRefusedWithoutALineNumber) {
@@ -170,9 +170,9 @@ TEST(PlainValue, VariableTypeMustBeKnown) {
 
 TEST(PlainValue, CounterIsTypeZero) {
     opened c;
-    c.cx.cb_rsrc_dattr.ra_var_type = ORB_QUANTUM;
+    c.cx.staged.cb_rsrc_dattr.ra_var_type = ORB_QUANTUM;
     EXPECT_EQ(fed(c, SC_DYNAMIC_RESOURCE_ATTRIBUTE, "VariableType=Counter"), WELL);
-    EXPECT_EQ(c.cx.cb_rsrc_dattr.ra_var_type, 0U);
+    EXPECT_EQ(c.cx.staged.cb_rsrc_dattr.ra_var_type, 0U);
 }
 
 TEST(PlainValue, ListActionsAreTakenAndIgnored) {
@@ -191,17 +191,17 @@ struct valid_value_kind {
     stanza_id kind;
     const char *attr;
     cdb_ref_t *(*list)(cdgen &);
-    vx_uint16_t cdgen::*found;
+    vx_uint16_t valid_value_lists::*found;
 };
 const valid_value_kind VALID_VALUE_KINDS[] = {
-    {SC_PERSISTENT_RESOURCE_ATTRIBUTE, "ValidValue", [](cdgen &cx) { return &cx.cb_rsrc_pattr.u_ra_valid_vals; },
-     &cdgen::pattr_vv_found},
-    {SC_PERSISTENT_CLASS_ATTRIBUTE, "ValidValue", [](cdgen &cx) { return &cx.cb_rsrc_pattrC.u_ra_valid_vals; },
-     &cdgen::pattrC_vv_found},
-    {SC_DYNAMIC_RESOURCE_ATTRIBUTE, "ValidStateValue", [](cdgen &cx) { return &cx.cb_rsrc_dattr.u_ra_valid_vals; },
-     &cdgen::dattr_vv_found},
-    {SC_DYNAMIC_CLASS_ATTRIBUTE, "ValidStateValue", [](cdgen &cx) { return &cx.cb_rsrc_dattrC.u_ra_valid_vals; },
-     &cdgen::dattrC_vv_found},
+    {SC_PERSISTENT_RESOURCE_ATTRIBUTE, "ValidValue", [](cdgen &cx) { return &cx.staged.cb_rsrc_pattr.u_ra_valid_vals; },
+     &valid_value_lists::pattr_vv_found},
+    {SC_PERSISTENT_CLASS_ATTRIBUTE, "ValidValue", [](cdgen &cx) { return &cx.staged.cb_rsrc_pattrC.u_ra_valid_vals; },
+     &valid_value_lists::pattrC_vv_found},
+    {SC_DYNAMIC_RESOURCE_ATTRIBUTE, "ValidStateValue",
+     [](cdgen &cx) { return &cx.staged.cb_rsrc_dattr.u_ra_valid_vals; }, &valid_value_lists::dattr_vv_found},
+    {SC_DYNAMIC_CLASS_ATTRIBUTE, "ValidStateValue", [](cdgen &cx) { return &cx.staged.cb_rsrc_dattrC.u_ra_valid_vals; },
+     &valid_value_lists::dattrC_vv_found},
 };
 
 /* An array's valid values are of its element type. */
@@ -215,7 +215,7 @@ TEST(ValidValue, FirstOneMakesTheListOfItsKind) {
                 EXPECT_EQ(fed(c, row.kind, std::string("DataType=") + type.type + array), WELL);
                 EXPECT_EQ(fed(c, row.kind, attr + "7"), WELL);
                 EXPECT_EQ(row.list(c.cx)->offset[0], 32U);
-                EXPECT_EQ(c.cx.*row.found, 1U);
+                EXPECT_EQ(c.cx.valid_values.*row.found, 1U);
                 EXPECT_EQ(fed(c, row.kind, attr + "9,7"), WELL);
                 std::vector<vv_entry_t> values = c.valid_values_at(*row.list(c.cx));
                 ASSERT_EQ(values.size(), 2U);
@@ -233,7 +233,7 @@ TEST(ValidValue, TextStandsInTheClassesStrings) {
     EXPECT_EQ(fed(c, SC_DYNAMIC_CLASS_ATTRIBUTE, "DataType=String"), WELL);
     EXPECT_EQ(fed(c, SC_DYNAMIC_CLASS_ATTRIBUTE, "ValidStateValue=low,the high,one"), WELL);
     EXPECT_EQ(fed(c, SC_DYNAMIC_CLASS_ATTRIBUTE, "ValidStateValue=one"), WELL);
-    std::vector<vv_entry_t> values = c.valid_values_at(c.cx.cb_rsrc_dattrC.u_ra_valid_vals);
+    std::vector<vv_entry_t> values = c.valid_values_at(c.cx.staged.cb_rsrc_dattrC.u_ra_valid_vals);
     ASSERT_EQ(values.size(), 2U);
     EXPECT_EQ(values[0].vv_high_val.val_uint64, cell32(0));
     EXPECT_EQ(values[0].vv_low_val.val_uint64, cell32(16));
@@ -249,7 +249,7 @@ TEST(ValidValue, BinaryIsItsLengthAndItsBytes) {
     opened c;
     EXPECT_EQ(fed(c, SC_PERSISTENT_RESOURCE_ATTRIBUTE, "DataType=BinaryArray"), WELL);
     EXPECT_EQ(fed(c, SC_PERSISTENT_RESOURCE_ATTRIBUTE, "ValidValue=0x616263,0x6465"), WELL);
-    vv_entry_t value = c.valid_values_at(c.cx.cb_rsrc_pattr.u_ra_valid_vals).at(0);
+    vv_entry_t value = c.valid_values_at(c.cx.staged.cb_rsrc_pattr.u_ra_valid_vals).at(0);
     EXPECT_EQ(value.vv_high_val.val_uint64, cell32(0));
     EXPECT_EQ(value.vv_low_val.val_uint64, cell32(16));
     EXPECT_EQ(c.string_table_at<vx_uint32_t>(0), 2U);
@@ -306,13 +306,13 @@ TEST(DataType, StructuredDataAwaitTheirRun) {
         for (const char *name : {"SD", "SDArray"}) {
             opened c;
             bool dynamic = kind == DYNAMIC[0] || kind == DYNAMIC[1];
-            c.cx.sd_attr_type = 9;
+            c.cx.sd.sd_attr_type = 9;
             EXPECT_EQ(fed(c, kind, std::string("DataType=") + name), WELL);
             auto *record = sc_cb(c.cx, sc_tables[kind]);
-            EXPECT_EQ(reinterpret_cast<char *>(c.cx.attr_dflt_val), record + (dynamic ? 32 : 24));
-            EXPECT_EQ(reinterpret_cast<char *>(c.cx.curr_sd_tbl), record + (dynamic ? 72 : 56));
-            EXPECT_EQ(reinterpret_cast<char *>(c.cx.max_sd_idx), record + (dynamic ? 124 : 64));
-            EXPECT_EQ(c.cx.sd_attr_type, dynamic ? 1 : 0);
+            EXPECT_EQ(reinterpret_cast<char *>(c.cx.sd.attr_dflt_val), record + (dynamic ? 32 : 24));
+            EXPECT_EQ(reinterpret_cast<char *>(c.cx.sd.curr_sd_tbl), record + (dynamic ? 72 : 56));
+            EXPECT_EQ(reinterpret_cast<char *>(c.cx.sd.max_sd_idx), record + (dynamic ? 124 : 64));
+            EXPECT_EQ(c.cx.sd.sd_attr_type, dynamic ? 1 : 0);
             const tbl &types = c.state(kind).dflt.tbl->cells;
             EXPECT_STREQ(types.tbl_name, std::string(name) == "SD" ? "VX_SD_PTR" : "VX_SD_PTR_ARRAY");
             EXPECT_EQ(types.tbl_au, 32U);
@@ -324,8 +324,8 @@ TEST(DataType, OnlyStructuredDataAwaitARun) {
     for (const char *name : {"None", "Int32", "String", "RH", "SBS", "RHArray", "Float64Array"}) {
         opened c;
         EXPECT_EQ(fed(c, SC_DYNAMIC_RESOURCE_ATTRIBUTE, std::string("DataType=") + name), WELL);
-        EXPECT_EQ(c.cx.attr_dflt_val, nullptr);
-        EXPECT_EQ(c.cx.curr_sd_tbl, nullptr);
+        EXPECT_EQ(c.cx.sd.attr_dflt_val, nullptr);
+        EXPECT_EQ(c.cx.sd.curr_sd_tbl, nullptr);
         EXPECT_EQ(c.state(SC_DYNAMIC_RESOURCE_ATTRIBUTE).dflt.tbl, nullptr);
     }
 }
@@ -395,7 +395,7 @@ TEST(DefaultValue, ZeroFailsAfterAnOverflow) {
 
 /* No resource attribute is open, so that the class attribute's own record gets the range. */
 void close_resource_attribute(opened &c) {
-    c.cx.cb_rsrc_dattr.ra_cb_ID = 0;
+    c.cx.staged.cb_rsrc_dattr.ra_cb_ID = 0;
 }
 
 TEST(Range, BoundsAreOfTheType) {
@@ -409,7 +409,7 @@ TEST(Range, BoundsAreOfTheType) {
             EXPECT_EQ(fed(c, kind, "Range=7,9"), WELL);
             EXPECT_EQ(attr.ra_min_value.val_uint64, type.seven);
             EXPECT_EQ(attr.ra_max_value.val_uint64, type.nine);
-            EXPECT_EQ(c.cx.dattr_range_found, 1U);
+            EXPECT_EQ(c.cx.range.dattr_range_found, 1U);
         }
 }
 
@@ -418,8 +418,8 @@ TEST(Range, ArraysBoundsAreArrays) {
     opened c;
     EXPECT_EQ(fed(c, SC_DYNAMIC_RESOURCE_ATTRIBUTE, "DataType=Float64Array"), WELL);
     EXPECT_EQ(fed(c, SC_DYNAMIC_RESOURCE_ATTRIBUTE, "Range=7,9"), WELL);
-    EXPECT_EQ(c.cx.cb_rsrc_dattr.ra_max_value.val_uint64, cell32(0));
-    EXPECT_EQ(c.cx.cb_rsrc_dattr.ra_min_value.val_uint64, cell32(16));
+    EXPECT_EQ(c.cx.staged.cb_rsrc_dattr.ra_max_value.val_uint64, cell32(0));
+    EXPECT_EQ(c.cx.staged.cb_rsrc_dattr.ra_min_value.val_uint64, cell32(16));
     EXPECT_EQ(c.string_table_at<vx_array_t>(0).element_count, 1U);
     EXPECT_EQ(c.string_table_at<vx_array_t>(0).elements[0].val_float64, 9.0);
     EXPECT_EQ(c.string_table_at<vx_array_t>(16).element_count, 1U);
@@ -434,7 +434,7 @@ TEST(Range, TypesWithoutBoundsIgnoreTheLine) {
             std::string before = record_of(c, kind);
             EXPECT_EQ(fed(c, kind, "Range=anything"), WELL) << type;
             EXPECT_EQ(record_of(c, kind), before) << type;
-            EXPECT_EQ(c.cx.dattr_range_found, 0U) << type;
+            EXPECT_EQ(c.cx.range.dattr_range_found, 0U) << type;
             EXPECT_NE(c.state(kind).opt_mask & 0x200, 0U) << type; /* a second one is one too many */
         }
 }
@@ -464,9 +464,9 @@ TEST(Range, OpenResourceAttributeGetsTheClassAttributes) {
     fed(c, SC_DYNAMIC_RESOURCE_ATTRIBUTE, "DataType=Int32");
     fed(c, SC_DYNAMIC_CLASS_ATTRIBUTE, "DataType=Float64");
     EXPECT_EQ(fed(c, SC_DYNAMIC_CLASS_ATTRIBUTE, "Range=7,9"), WELL);
-    EXPECT_EQ(c.cx.cb_rsrc_dattr.ra_min_value.val_float64, 7.0);
-    EXPECT_EQ(c.cx.cb_rsrc_dattr.ra_max_value.val_float64, 9.0);
-    EXPECT_EQ(c.cx.cb_rsrc_dattrC.ra_max_value.val_uint64, 0U);
+    EXPECT_EQ(c.cx.staged.cb_rsrc_dattr.ra_min_value.val_float64, 7.0);
+    EXPECT_EQ(c.cx.staged.cb_rsrc_dattr.ra_max_value.val_float64, 9.0);
+    EXPECT_EQ(c.cx.staged.cb_rsrc_dattrC.ra_max_value.val_uint64, 0U);
 }
 
 /* Deliberate: the mark is shared, and the first attribute to be completed takes it. */
@@ -477,7 +477,7 @@ TEST(Range, MarkIsTakenByTheNextCompletion) {
     const rsrc_dattr_t &other = c.filed<rsrc_dattr_t>(&rsrc_class_t::u_rc_dattrsC)[0];
     EXPECT_EQ(other.ra_min_value.val_uint64, 0U);
     EXPECT_EQ(other.ra_max_value.val_uint64, 0U);
-    EXPECT_EQ(c.cx.dattr_range_found, 0U);
+    EXPECT_EQ(c.cx.range.dattr_range_found, 0U);
     c.read("DynamicResourceAttribute\n");
     const rsrc_dattr_t &owner = c.filed<rsrc_dattr_t>(&rsrc_class_t::u_rc_dattrs)[0];
     EXPECT_EQ(owner.ra_min_value.val_uint64, cell32(0));

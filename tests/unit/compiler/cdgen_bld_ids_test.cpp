@@ -1,6 +1,7 @@
 /* The variable IDs of each variable class, and the table that pairs classes with their lists. */
 
 #include "compiler/cdgen.h"
+#include "compiler/given_interface.h"
 
 #include <gtest/gtest.h>
 
@@ -49,7 +50,7 @@ protected:
         stage_tbl(record.u_rc_strings, strings);
         stage_tbl(record.u_rc_dattrsC, staged(of_class, strings));
         stage_tbl(record.u_rc_dattrs, staged(of_resource, strings));
-        append(&cx.rsrc_class_tbl, record);
+        append(&cx.sections.rsrc_class_tbl, record);
     }
 
     void add_variable_class(const std::string &name, const std::string &first_string = "") {
@@ -59,11 +60,11 @@ protected:
             add_text(strings, first_string);
         record.u_rvc_name = {{add_text(strings, name), 0}};
         stage_tbl(record.u_rvc_string_tbl, strings);
-        append(&cx.rsrc_var_class_tbl, record);
+        append(&cx.sections.rsrc_var_class_tbl, record);
     }
 
     rsrc_variable_class_t &variable_class(size_t n) {
-        return records_of<rsrc_variable_class_t>(&cx.rsrc_var_class_tbl)[n];
+        return records_of<rsrc_variable_class_t>(&cx.sections.rsrc_var_class_tbl)[n];
     }
 
     ids ids_of(size_t n) {
@@ -124,7 +125,7 @@ TEST_F(VariableIds, EachVariableClassHasItsOwn) {
     EXPECT_EQ(ids_of(1), (ids{}));
     EXPECT_EQ(ids_of(2), (ids{0x8001, 4}));
     EXPECT_EQ(find_tbl_entry(cx, &variable_class(1)), nullptr);
-    EXPECT_EQ(cx.tbl_entry_used, 2u);
+    EXPECT_EQ(cx.variable_ids.tbl_entry_used, 2u);
 }
 
 TEST_F(VariableIds, OfTwoVariableClassesWithOneNameTheFirstHasAll) {
@@ -149,7 +150,7 @@ TEST_F(VariableIds, NamesMustBeEqualByteForByte) {
 TEST_F(VariableIds, VariableClassWithoutStringsIsNeverFound) {
     rsrc_variable_class_t unnamed = {};
     stage_tbl(unnamed.u_rvc_string_tbl, make_tbl(cx, 8192, "VarClassStrings"));
-    append(&cx.rsrc_var_class_tbl, unnamed);
+    append(&cx.sections.rsrc_var_class_tbl, unnamed);
     add_variable_class("V");
     add_class({{1, ""}}, {{2, "V"}});
     bld_var_id_tbls(cx);
@@ -162,7 +163,7 @@ TEST_F(VariableIds, AttributesReferenceIsClearedWhetherItNamedAClassOrNot) {
     attributes all = {{1, "V"}, {2, "unknown"}, {3, nullptr}};
     add_class(all, all);
     bld_var_id_tbls(cx);
-    const rsrc_class_t &record = records_of<rsrc_class_t>(&cx.rsrc_class_tbl)[0];
+    const rsrc_class_t &record = records_of<rsrc_class_t>(&cx.sections.rsrc_class_tbl)[0];
     for (const cdb_ref_t &table : {record.u_rc_dattrsC, record.u_rc_dattrs}) {
         std::span<rsrc_dattr_t> attrs = records_of<rsrc_dattr_t>(staged_tbl(table));
         ASSERT_EQ(attrs.size(), 3u);
@@ -178,14 +179,14 @@ TEST_F(VariableIds, AttributesReferenceIsClearedWhetherItNamedAClassOrNot) {
 TEST_F(VariableIds, UnknownNameIsDroppedInSilence) {
     add_class({{1, "V"}}, {{2, "V"}}); /* no variable class at all */
     bld_var_id_tbls(cx);
-    EXPECT_EQ(cx.tbl_entry_used, 0u);
+    EXPECT_EQ(cx.variable_ids.tbl_entry_used, 0u);
 }
 
 TEST_F(VariableIds, NothingStagedIsNoError) {
     bld_var_id_tbls(cx);
-    append(&cx.rsrc_class_tbl, rsrc_class_t{}); /* a class whose tables hold nothing */
+    append(&cx.sections.rsrc_class_tbl, rsrc_class_t{}); /* a class whose tables hold nothing */
     bld_var_id_tbls(cx);
-    EXPECT_EQ(cx.tbl_entry_used, 0u);
+    EXPECT_EQ(cx.variable_ids.tbl_entry_used, 0u);
 }
 
 TEST_F(VariableIds, ListGrowsByUnitsOf64Bytes) {
@@ -234,7 +235,7 @@ TEST_F(VariableIds, HundredVariableClassesMayHaveThem) {
         add_variable_class(name);
     add_class({}, attributes_naming(names));
     bld_var_id_tbls(cx);
-    EXPECT_EQ(cx.tbl_entry_used, 100u);
+    EXPECT_EQ(cx.variable_ids.tbl_entry_used, 100u);
     EXPECT_EQ(ids_of(0), (ids{}));
     EXPECT_EQ(ids_of(100), (ids{9}));
 }
@@ -295,12 +296,12 @@ TEST_F(VariableIdPairs, DeletingClearsEveryPairOfTheClassAndFreesNoPlace) {
     EXPECT_EQ(find_tbl_entry(cx, &classes[0]), nullptr);
     EXPECT_EQ(find_tbl_entry(cx, &classes[1]), &lists[1]);
     for (size_t cleared : {size_t{0}, size_t{2}}) {
-        EXPECT_EQ(cx.tbl_entries[cleared].rvcp, nullptr);
-        EXPECT_EQ(cx.tbl_entries[cleared].tp, nullptr);
+        EXPECT_EQ(cx.variable_ids.tbl_entries[cleared].rvcp, nullptr);
+        EXPECT_EQ(cx.variable_ids.tbl_entries[cleared].tp, nullptr);
     }
-    EXPECT_EQ(cx.tbl_entry_used, 3u);
+    EXPECT_EQ(cx.variable_ids.tbl_entry_used, 3u);
     add_tbl_entry(cx, &classes[2], &lists[0]);
-    EXPECT_EQ(cx.tbl_entries[3].rvcp, &classes[2]);
+    EXPECT_EQ(cx.variable_ids.tbl_entries[3].rvcp, &classes[2]);
 }
 
 TEST_F(VariableIdPairs, DeletingAnUnknownClassChangesNothing) {
@@ -314,7 +315,7 @@ TEST_F(VariableIdPairs, HundredFitAndTheNextIsFatal) {
         add_tbl_entry(cx, &classes[i], &lists[i % 2]);
     EXPECT_EQ(find_tbl_entry(cx, &classes[99]), &lists[1]);
     EXPECT_THROW(add_tbl_entry(cx, &classes[100], &lists[0]), fatal_exit);
-    EXPECT_EQ(cx.tbl_entry_used, 100u);
+    EXPECT_EQ(cx.variable_ids.tbl_entry_used, 100u);
 }
 
 TEST_F(VariableIdPairs, DeletedPlacesDoNotMakeRoom) {

@@ -1,6 +1,7 @@
 /* The image builder: checksum, sizes, sections, and the life of the output file. */
 
 #include "compiler/cdgen.h"
+#include "format/checksum.h"
 
 #include "compiler/image_fixture.h"
 
@@ -81,31 +82,31 @@ protected:
         for (auto field : side_tables)
             stage_tbl(record.*field, table(*size++, letter++));
         record.rc_class_id = id;
-        append(&cx.rsrc_class_tbl, cx.rsrc_class_count, record);
+        append(&cx.sections.rsrc_class_tbl, cx.sections.rsrc_class_count, record);
     }
 
     void add_mgr(size_t strings, vx_uint16_t id = 0) {
         auto record = arbitrary<rsrc_mgr_t>();
         record.rm_id = id;
         stage_tbl(record.u_rm_strings_table, table(strings, 'n'));
-        append(&cx.rsrc_mgr_tbl, cx.rsrc_mgr_count, record);
+        append(&cx.sections.rsrc_mgr_tbl, cx.sections.rsrc_mgr_count, record);
     }
 
     void add_map(size_t strings) {
         auto record = arbitrary<rsrc_cmmap_t>();
         stage_tbl(record.u_rcm_strings, table(strings, 'o'));
-        append(&cx.rsrc_cmmap_tbl, cx.rsrc_cmmap_count, record);
+        append(&cx.sections.rsrc_cmmap_tbl, cx.sections.rsrc_cmmap_count, record);
     }
 
     void add_variable_class(size_t strings, vx_uint32_t ids) {
         auto record = arbitrary<rsrc_variable_class_t>();
         record.rvc_var_count = ids;
         stage_tbl(record.u_rvc_string_tbl, table(strings, 'p'));
-        append(&cx.rsrc_var_class_tbl, cx.rsrc_var_class_count, record);
+        append(&cx.sections.rsrc_var_class_tbl, cx.sections.rsrc_var_class_count, record);
     }
 
     rsrc_class_t &staged_class(size_t n = 0) {
-        return records_of<rsrc_class_t>(&cx.rsrc_class_tbl)[n];
+        return records_of<rsrc_class_t>(&cx.sections.rsrc_class_tbl)[n];
     }
 
     cdgen cx;
@@ -134,7 +135,7 @@ using ImageSize = Builder;
 
 TEST_F(ImageSize, OfNothingIsHeaderAndAnchors) {
     for (int sections : {0, 1, 7}) {
-        cx.dsect_count = sections;
+        cx.image.dsect_count = sections;
         EXPECT_EQ(cdb_size(cx), 80u + 16u * static_cast<unsigned>(sections));
     }
 }
@@ -241,7 +242,7 @@ TEST_F(ImageSize, MoreThan65535RecordsOfOneKindAreRefused) {
         alloc_tble(cx, staged_tbl(staged_class().*side_tables[row.number]), row.record);
         EXPECT_EQ(fatal_message([this] { cdb_size(cx); }),
                   "Too many records of one kind in a class (65535 at most): Table");
-        cx.rsrc_class_tbl.tbl_next = cx.rsrc_class_tbl.tbl_base;
+        cx.sections.rsrc_class_tbl.tbl_next = cx.sections.rsrc_class_tbl.tbl_base;
     }
 }
 
@@ -313,13 +314,13 @@ class ImageSection : public Builder {
 protected:
     image written_by(void (*writer)(cdgen &), size_t size, size_t anchors = 2) {
         image made = blank(size);
-        cx.chp = made.at(0);
-        cx.dsect_anchs = cx.chp + 80;
-        cx.dsect_idx = 0;
-        cx.dsp = cx.dsect_anchs + 16 * anchors;
-        cx.gross_file_size = size;
+        cx.image.chp = made.at(0);
+        cx.image.dsect_anchs = cx.image.chp + 80;
+        cx.image.dsect_idx = 0;
+        cx.image.dsp = cx.image.dsect_anchs + 16 * anchors;
+        cx.output.gross_file_size = size;
         writer(cx);
-        EXPECT_EQ(cx.dsp - cx.chp, static_cast<ptrdiff_t>(size));
+        EXPECT_EQ(cx.image.dsp - cx.image.chp, static_cast<ptrdiff_t>(size));
         return made;
     }
 };
@@ -397,7 +398,7 @@ TEST_F(ImageSection, VariableIdsFollowTheStringsWhoseLengthIsInTheReference) {
     add_variable_class(9, 3);
     add_variable_class(3, 0);
     tbl *ids = table(12, 'i');
-    add_tbl_entry(cx, &records_of<rsrc_variable_class_t>(&cx.rsrc_var_class_tbl)[0], ids);
+    add_tbl_entry(cx, &records_of<rsrc_variable_class_t>(&cx.sections.rsrc_var_class_tbl)[0], ids);
     image expected = blank(112 + 72 + 48);
     put_anchor(expected, 0, 4, 112, 72);
     put_anchor(expected, 1, 4, 184, 48);
@@ -449,7 +450,7 @@ protected:
 
     void name_output(const std::filesystem::path &path) {
         output = path;
-        cx.cdefname = output.c_str();
+        cx.options.cdefname = output.c_str();
     }
 
     /* The least that makes a database: LEAST bytes and the class's strings. */
@@ -502,7 +503,7 @@ TEST_F(ImageFile, IsHeaderAnchorsAndSectionsInTheirOrder) {
     add_mgr(4, 1);
     add_class({{72, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 9}}, 2);
     add_map(1);
-    add_tbl_entry(cx, records_of<rsrc_variable_class_t>(&cx.rsrc_var_class_tbl).data(), table(4, 'i'));
+    add_tbl_entry(cx, records_of<rsrc_variable_class_t>(&cx.sections.rsrc_var_class_tbl).data(), table(4, 'i'));
     ASSERT_EQ(build(), "none");
 
     image expected = blank(688);
@@ -542,7 +543,7 @@ class ImagePrefill : public ImageFile, public testing::WithParamInterface<prefil
 TEST_P(ImagePrefill, IsRoundedUpTo1024AndTheFileCutToItsImage) {
     add_least(GetParam().class_strings);
     ASSERT_EQ(build(), "none");
-    EXPECT_EQ(cx.gross_file_size, GetParam().prefill);
+    EXPECT_EQ(cx.output.gross_file_size, GetParam().prefill);
     EXPECT_EQ(contents().bytes.size(), GetParam().size);
     EXPECT_EQ(contents().word(0), GetParam().size - 4);
 }
@@ -558,7 +559,7 @@ TEST_F(ImageFile, ExactMultipleOf1024IsPrefilledExactly) {
     add_least(496);
     add_map(16);
     ASSERT_EQ(build(), "none");
-    EXPECT_EQ(cx.gross_file_size, 1024u);
+    EXPECT_EQ(cx.output.gross_file_size, 1024u);
     EXPECT_EQ(contents().bytes.size(), 1024u);
 }
 
@@ -577,8 +578,8 @@ TEST_F(ImageFile, IsRemovedIfThePrefillHasNoRoom) {
     add_map(0);
     EXPECT_EQ(build(), "Image larger than computed - internal error");
     EXPECT_FALSE(std::filesystem::exists(output));
-    EXPECT_EQ(cx.cdb_mapfile_fd, 0);
-    EXPECT_EQ(cx.cdb_mapfile_ptr, nullptr);
+    EXPECT_EQ(cx.output.cdb_mapfile_fd, 0);
+    EXPECT_EQ(cx.output.cdb_mapfile_ptr, nullptr);
 }
 
 /* One message, that of the first section without records. */
@@ -626,8 +627,8 @@ TEST_F(ImageFile, OutputThatIsTheSourceStaysAsItWas) {
     write_output("the source");
     struct stat st = {};
     ASSERT_EQ(stat(output.c_str(), &st), 0);
-    cx.cdb_fp.device = st.st_dev;
-    cx.cdb_fp.inode = st.st_ino;
+    cx.source.cdb_fp.device = st.st_dev;
+    cx.source.cdb_fp.inode = st.st_ino;
     EXPECT_EQ(build(), "Cannot create CDB file: it is the source file");
     EXPECT_EQ(std::string(contents().at(0), 10), "the source");
 }
@@ -731,7 +732,7 @@ TEST_F(ImageFile, TimestampIsZeroOnlyIfTheVariableExists) {
 
 TEST_F(ImageFile, ReversedItIsAsLong) {
     add_least(12);
-    cx.swap_endianness = 1;
+    cx.options.swap_endianness = 1;
     ASSERT_EQ(build(), "none");
     image made = contents();
     EXPECT_EQ(made.bytes.size(), LEAST + 16);
@@ -747,22 +748,22 @@ TEST_F(ImageFile, PlacesOfReferencesThatLeadNowhereAreHandedToTheReversal) {
         add_class(two_of_each);
     add_mgr(0);
     add_map(0);
-    cx.strays = {{0, &rsrc_class_t::u_rc_pattrsC, 72 + 48},
-                 {0, &rsrc_class_t::u_rc_dattrs, 136 + 64},
-                 {1, &rsrc_class_t::u_rc_dattrsC, 136 + 64},
-                 {1, &rsrc_class_t::u_rc_pattrs, 72 + 48}};
+    cx.stray.strays = {{0, &rsrc_class_t::u_rc_pattrsC, 72 + 48},
+                       {0, &rsrc_class_t::u_rc_dattrs, 136 + 64},
+                       {1, &rsrc_class_t::u_rc_dattrsC, 136 + 64},
+                       {1, &rsrc_class_t::u_rc_pattrs, 72 + 48}};
     for (size_t n : {size_t{0}, size_t{1}}) {
         char *list = staged_tbl(staged_class(n).u_rc_valid_vals)->tbl_base;
         memcpy(list, image(32).u32(4, 1).at(0), 32);
         staged_class(n).rc_num_errors = staged_class(n).rc_num_depends = 0;
     }
-    for (const stray_reference &s : cx.strays)
+    for (const stray_reference &s : cx.stray.strays)
         memset(staged_tbl(staged_class(static_cast<size_t>(s.rsrc_class)).*s.records)->tbl_base + s.offset, 0, 8);
-    cx.swap_endianness = 1;
+    cx.options.swap_endianness = 1;
     ASSERT_EQ(build(), "none");
     constexpr size_t FIRST = 144, SECOND = 144 + 224 + 832 + 32;
-    EXPECT_EQ(cx.nowhere, (std::vector<size_t>{FIRST + 224 + 120, FIRST + 224 + 832 - 72, SECOND + 224 + 344,
-                                               SECOND + 224 + 416 + 120}));
+    EXPECT_EQ(cx.stray.nowhere, (std::vector<size_t>{FIRST + 224 + 120, FIRST + 224 + 832 - 72, SECOND + 224 + 344,
+                                                     SECOND + 224 + 416 + 120}));
     for (size_t section : {FIRST, SECOND})
         EXPECT_EQ(std::string(contents().at(section + 224 + 832), 32), std::string(image(32).u32(4, 1).at(0), 32));
 }
@@ -778,15 +779,15 @@ TEST_F(ImageFile, ThatIsNotMappedIsLeftAlone) {
 TEST_F(ImageFile, ThatIsMappedGoesWithTheBuildThatFails) {
     EXPECT_EQ(build(), "No Rsrc Class Tables found");
     EXPECT_FALSE(std::filesystem::exists(output));
-    EXPECT_EQ(cx.cdb_mapfile_fd, 0);
+    EXPECT_EQ(cx.output.cdb_mapfile_fd, 0);
 }
 
 TEST_F(ImageFile, ThatIsMappedGoesWithTheContext) {
     write_output(std::string(1024, 'x'));
     {
         cdgen mapped;
-        mapped.cdefname = output.c_str();
-        mapped.cdb_mapfile_fd = dup(STDERR_FILENO);
+        mapped.options.cdefname = output.c_str();
+        mapped.output.cdb_mapfile_fd = dup(STDERR_FILENO);
     }
     EXPECT_FALSE(std::filesystem::exists(output));
 }

@@ -2,6 +2,7 @@
 
 #include "compiler/cdgen.h"
 #include "compiler/cdgen_stanzas.h"
+#include "compiler/given_interface.h"
 
 #include <gtest/gtest.h>
 
@@ -131,28 +132,30 @@ struct kind_row {
 };
 
 template <auto Member> char *in(cdgen &cx) {
-    return reinterpret_cast<char *>(&(cx.*Member));
+    return reinterpret_cast<char *>(&(cx.staged.*Member));
 }
 
-constexpr auto CLASS = in<&cdgen::cb_rsrc_class>;
-constexpr auto SD = in<&cdgen::cb_sd_def>;
+constexpr auto CLASS = in<&staging_records::cb_rsrc_class>;
+constexpr auto SD = in<&staging_records::cb_sd_def>;
 constexpr int P_TYPE = 36, D_TYPE = 104, E_TYPE = 16;
 constexpr sd_type_t NO_SD = SD_TYPE_UNKNOWN;
 
 const std::vector<kind_row> KINDS = {
     {"ControlDefinition", CLASS, init_class_tbl, 0x1, &CONTROL, -1, CLASS_TABLES, NO_SD},
-    {"ClassToManagerMapping", in<&cdgen::cb_rsrc_cmmap>, init_cmmap_tbl, 0x1f, &CMMAP, -1, MAP_TABLES, NO_SD},
-    {"ResourceVariableClass", in<&cdgen::cb_rsrc_variable_class>, init_var_class_tbl, 0x7, &VARIABLE_CLASS, -1,
-     VARIABLE_CLASS_TABLES, NO_SD},
+    {"ClassToManagerMapping", in<&staging_records::cb_rsrc_cmmap>, init_cmmap_tbl, 0x1f, &CMMAP, -1, MAP_TABLES, NO_SD},
+    {"ResourceVariableClass", in<&staging_records::cb_rsrc_variable_class>, init_var_class_tbl, 0x7, &VARIABLE_CLASS,
+     -1, VARIABLE_CLASS_TABLES, NO_SD},
     {"ResourceClass", CLASS, init_class_tbl_fake, 0x1f, &RSRC_CLASS, -1, CLASS_TABLES, NO_SD},
-    {"PersistentResourceAttribute", in<&cdgen::cb_rsrc_pattr>, init_pattr_tbl, 0x3f, &PATTR, P_TYPE, CLASS_TABLES,
+    {"PersistentResourceAttribute", in<&staging_records::cb_rsrc_pattr>, init_pattr_tbl, 0x3f, &PATTR, P_TYPE,
+     CLASS_TABLES, NO_SD},
+    {"PersistentClassAttribute", in<&staging_records::cb_rsrc_pattrC>, init_pattrC_tbl, 0x3f, &PATTR, P_TYPE,
+     CLASS_TABLES, NO_SD},
+    {"DynamicResourceAttribute", in<&staging_records::cb_rsrc_dattr>, init_dattr_tbl, 0x7f, &DATTR, D_TYPE,
+     CLASS_TABLES, NO_SD},
+    {"DynamicClassAttribute", in<&staging_records::cb_rsrc_dattrC>, init_dattrC_tbl, 0x7f, &DATTR, D_TYPE, CLASS_TABLES,
      NO_SD},
-    {"PersistentClassAttribute", in<&cdgen::cb_rsrc_pattrC>, init_pattrC_tbl, 0x3f, &PATTR, P_TYPE, CLASS_TABLES,
-     NO_SD},
-    {"DynamicResourceAttribute", in<&cdgen::cb_rsrc_dattr>, init_dattr_tbl, 0x7f, &DATTR, D_TYPE, CLASS_TABLES, NO_SD},
-    {"DynamicClassAttribute", in<&cdgen::cb_rsrc_dattrC>, init_dattrC_tbl, 0x7f, &DATTR, D_TYPE, CLASS_TABLES, NO_SD},
-    {"ClassAction", in<&cdgen::cb_rsrc_actionC>, init_actionC_tbl, 0x1f, &ACTION, -1, CLASS_TABLES, NO_SD},
-    {"ResourceAction", in<&cdgen::cb_rsrc_action>, init_action_tbl, 0x1f, &ACTION, -1, CLASS_TABLES, NO_SD},
+    {"ClassAction", in<&staging_records::cb_rsrc_actionC>, init_actionC_tbl, 0x1f, &ACTION, -1, CLASS_TABLES, NO_SD},
+    {"ResourceAction", in<&staging_records::cb_rsrc_action>, init_action_tbl, 0x1f, &ACTION, -1, CLASS_TABLES, NO_SD},
     {"PAttrSDDefinition", SD, init_sd_tbl, 0x1f, &ELEMENT, E_TYPE, CLASS_TABLES, SD_TYPE_PATTR},
     {"DAttrSDDefinition", SD, init_sd_tbl, 0x1f, &ELEMENT, E_TYPE, CLASS_TABLES, SD_TYPE_DATTR},
     {"DefineSDDefinition", SD, init_sd_tbl, 0x1f, &ELEMENT, E_TYPE, CLASS_TABLES, SD_TYPE_DEFINE},
@@ -218,12 +221,12 @@ struct tables_of_kind {
 TEST(Catalogue, KindsReachTheirStagingTables) {
     cdgen cx;
     tbl names(8, ""), varieties(8, ""), values(8, ""), sds(8, ""), map(8, ""), variable_class(8, "");
-    stage_tbl(cx.cb_rsrc_class.u_rc_strings, &names);
-    stage_tbl(cx.cb_rsrc_class.u_rc_variety_lists, &varieties);
-    stage_tbl(cx.cb_rsrc_class.u_rc_valid_vals, &values);
-    stage_tbl(cx.cb_rsrc_class.u_rc_sd_defs, &sds);
-    stage_tbl(cx.cb_rsrc_cmmap.u_rcm_strings, &map);
-    stage_tbl(cx.cb_rsrc_variable_class.u_rvc_string_tbl, &variable_class);
+    stage_tbl(cx.staged.cb_rsrc_class.u_rc_strings, &names);
+    stage_tbl(cx.staged.cb_rsrc_class.u_rc_variety_lists, &varieties);
+    stage_tbl(cx.staged.cb_rsrc_class.u_rc_valid_vals, &values);
+    stage_tbl(cx.staged.cb_rsrc_class.u_rc_sd_defs, &sds);
+    stage_tbl(cx.staged.cb_rsrc_cmmap.u_rcm_strings, &map);
+    stage_tbl(cx.staged.cb_rsrc_variable_class.u_rvc_string_tbl, &variable_class);
     const tables_of_kind expected[] = {{&names, &varieties, &values, &sds},        /* CLASS_TABLES */
                                        {&map, nullptr, nullptr, nullptr},          /* MAP_TABLES */
                                        {&variable_class, nullptr, nullptr, &sds}}; /* VARIABLE_CLASS_TABLES */
@@ -239,14 +242,14 @@ TEST(Catalogue, KindsReachTheirStagingTables) {
 
 TEST(Catalogue, AttributeKindsKnowTheirValueFields) {
     struct expected_row {
-        vx_uint16_t cdgen::*found;
+        vx_uint16_t valid_value_lists::*found;
         attr_kind fields;
     };
     const std::map<std::string, expected_row> expected = {
-        {"PersistentResourceAttribute", {&cdgen::pattr_vv_found, {0, 24, 56, 64}}},
-        {"PersistentClassAttribute", {&cdgen::pattrC_vv_found, {0, 24, 56, 64}}},
-        {"DynamicResourceAttribute", {&cdgen::dattr_vv_found, {1, 32, 72, 124}}},
-        {"DynamicClassAttribute", {&cdgen::dattrC_vv_found, {1, 32, 72, 124}}}};
+        {"PersistentResourceAttribute", {&valid_value_lists::pattr_vv_found, {0, 24, 56, 64}}},
+        {"PersistentClassAttribute", {&valid_value_lists::pattrC_vv_found, {0, 24, 56, 64}}},
+        {"DynamicResourceAttribute", {&valid_value_lists::dattr_vv_found, {1, 32, 72, 124}}},
+        {"DynamicClassAttribute", {&valid_value_lists::dattrC_vv_found, {1, 32, 72, 124}}}};
     cdgen cx;
     for (size_t i = 0; i < KINDS.size(); ++i) {
         SCOPED_TRACE(KINDS[i].name);
@@ -254,7 +257,7 @@ TEST(Catalogue, AttributeKindsKnowTheirValueFields) {
         ASSERT_EQ(kind_at(i).sc_attr != nullptr, row != expected.end());
         if (row == expected.end())
             continue;
-        EXPECT_EQ(&vv_found(cx, kind_at(i)), &(cx.*row->second.found));
+        EXPECT_EQ(&vv_found(cx, kind_at(i)), &(cx.valid_values.*row->second.found));
         EXPECT_EQ(kind_at(i).sc_attr->sd_attr_type, row->second.fields.sd_attr_type);
         EXPECT_EQ(kind_at(i).sc_attr->value_offset, row->second.fields.value_offset);
         EXPECT_EQ(kind_at(i).sc_attr->sd_offset, row->second.fields.sd_offset);

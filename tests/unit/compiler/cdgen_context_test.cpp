@@ -1,6 +1,7 @@
 /* A second compilation in the same process starts clean. */
 
 #include "compiler/cdgen.h"
+#include "compiler/cdgen_process.h"
 
 #include <gtest/gtest.h>
 

@@ -1,5 +1,6 @@
 /* Actions of resources and of classes, their varieties and permissions; and the lists that stanzas begin. */
 
+#include "compiler/given_interface.h"
 #include "compiler/source_fixture.h"
 
 namespace {
@@ -8,7 +9,7 @@ using namespace from_source;
 
 struct action_row {
     stanza_id id;
-    rsrc_action_t cdgen::*record;
+    rsrc_action_t staging_records::*record;
     cdb_ref_t rsrc_class_t::*records;
     vx_uint32_t cb_id;
     void (*init)(cdgen &);
@@ -20,9 +21,9 @@ struct action_row {
 };
 
 const action_row KINDS[] = {
-    {SC_RESOURCE_ACTION, &cdgen::cb_rsrc_action, &rsrc_class_t::u_rc_actions, 0x43444262, init_action_tbl,
+    {SC_RESOURCE_ACTION, &staging_records::cb_rsrc_action, &rsrc_class_t::u_rc_actions, 0x43444262, init_action_tbl,
      cmplt_action_tbl},
-    {SC_CLASS_ACTION, &cdgen::cb_rsrc_actionC, &rsrc_class_t::u_rc_actionsC, 0x43444263, init_actionC_tbl,
+    {SC_CLASS_ACTION, &staging_records::cb_rsrc_actionC, &rsrc_class_t::u_rc_actionsC, 0x43444263, init_actionC_tbl,
      cmplt_actionC_tbl},
 };
 
@@ -35,7 +36,7 @@ rsrc_action_t completed(compilation &c, const action_row &kind, lines more = {})
     kind.complete(c.cx);
     auto records = c.filed<rsrc_action_t>(kind.records);
     EXPECT_EQ(records.size(), 1U);
-    EXPECT_EQ((c.cx.*kind.record).ac_cb_ID, 0U);
+    EXPECT_EQ((c.cx.staged.*kind.record).ac_cb_ID, 0U);
     return records[0];
 }
 
@@ -44,15 +45,15 @@ TEST(Action, OpensAsEmptyRecord) {
         compilation c;
         init_class_tbl(c.cx);
         mk_vty_sec(c.cx); /* another list before its own */
-        (c.cx.*kind.record).ac_timeout = 3;
-        c.cx.vvdisp = 0;
+        (c.cx.staged.*kind.record).ac_timeout = 3;
+        c.cx.valid_values.vvdisp = 0;
         kind.init(c.cx);
         rsrc_action_t expected = {};
         expected.ac_cb_ID = kind.cb_id;
         expected.u_ac_variety_list = {{16, 0}};
         expected.u_ac_sd_input = expected.u_ac_sd_resp = {{0xFFFFFFFF, 0}};
-        EXPECT_EQ(bytes_of(c.cx.*kind.record), bytes_of(expected));
-        EXPECT_FALSE(c.cx.vvdisp.has_value());
+        EXPECT_EQ(bytes_of(c.cx.staged.*kind.record), bytes_of(expected));
+        EXPECT_FALSE(c.cx.valid_values.vvdisp.has_value());
     }
 }
 
@@ -61,7 +62,7 @@ TEST(Action, NeedsAClass) {
     for (const action_row &kind : KINDS)
         for (auto step : {kind.init, kind.complete}) {
             opened c;
-            c.cx.cb_rsrc_class.rc_cb_ID = 0;
+            c.cx.staged.cb_rsrc_class.rc_cb_ID = 0;
             EXPECT_EQ(ending_of([&] { step(c.cx); }), (ending{"No class for class action", LINE, 1}));
             compilation nothing_open;
             EXPECT_EQ(nothing_open.reading(kind.name()), (ending{"No class for class action", 1, 1}));
@@ -79,7 +80,7 @@ TEST(Action, NeedsAllItsRequiredAttributes) {
             c.state(kind.id).req_mask = 0x1f;
             kind.init(c.cx);
             EXPECT_EQ(c.filed<rsrc_action_t>(kind.records).size(), 1U);
-            EXPECT_EQ((c.cx.*kind.record).ac_cb_ID, kind.cb_id);
+            EXPECT_EQ((c.cx.staged.*kind.record).ac_cb_ID, kind.cb_id);
         }
 }
 
@@ -150,9 +151,9 @@ TEST(Permission, IsItsFirstLettersMask) {
     };
     for (const auto &[text, mask] : rows) {
         opened c;
-        c.cx.cb_rsrc_action.ac_perms = 0x777;
+        c.cx.staged.cb_rsrc_action.ac_perms = 0x777;
         EXPECT_EQ(fed(c, SC_RESOURCE_ACTION, "Permission=" + text), WELL);
-        EXPECT_EQ(c.cx.cb_rsrc_action.ac_perms, mask) << text;
+        EXPECT_EQ(c.cx.staged.cb_rsrc_action.ac_perms, mask) << text;
     }
 }
 
@@ -161,11 +162,11 @@ TEST(Permission, IsItsFirstLettersMask) {
 const cdb_ref_t &variety_list(const opened &c, stanza_id kind) {
     switch (kind) {
     case SC_PERSISTENT_RESOURCE_ATTRIBUTE:
-        return c.cx.cb_rsrc_pattr.u_ra_variety_list;
+        return c.cx.staged.cb_rsrc_pattr.u_ra_variety_list;
     case SC_DYNAMIC_CLASS_ATTRIBUTE:
-        return c.cx.cb_rsrc_dattrC.u_ra_variety_list;
+        return c.cx.staged.cb_rsrc_dattrC.u_ra_variety_list;
     default:
-        return c.cx.cb_rsrc_actionC.u_ac_variety_list;
+        return c.cx.staged.cb_rsrc_actionC.u_ac_variety_list;
     }
 }
 
@@ -179,7 +180,7 @@ TEST(Variety, RangesStandInTheirOrder) {
     opened c; /* the last list of its table, as it is while its stanza is read */
     for (const char *line : {"VarietyRange=0x10,-1", "VarietyRange= 7 x, 010", "VarietyRange=9,3", "VarietyRange=,"})
         EXPECT_EQ(fed(c, SC_CLASS_ACTION, line), WELL);
-    EXPECT_EQ(c.varieties_at(c.cx.cb_rsrc_actionC.u_ac_variety_list),
+    EXPECT_EQ(c.varieties_at(c.cx.staged.cb_rsrc_actionC.u_ac_variety_list),
               (ranges{{16, 0xFFFFFFFF}, {7, 8}, {9, 3}, {0, 0}}));
 }
 
@@ -225,7 +226,7 @@ TEST(Section, OfDefaultValuesIsForStructuredDataOnly) {
     EXPECT_EQ(mk_sd_data_tbl(c.cx, VX_SD_PTR_ARRAY, &values), 24U);
     EXPECT_EQ(mk_sd_data_tbl(c.cx, VX_SD_PTR, &values), 40U);
     EXPECT_EQ(std::string(values.tbl_base, values.used()), std::string(64, '\0'));
-    c.cx.linenum = LINE;
+    c.cx.source.linenum = LINE;
     for (int type : {0, 10, 12, 21, 23})
         EXPECT_EQ(ending_of([&] { mk_sd_data_tbl(c.cx, static_cast<vx_data_type_t>(type), &values); }),
                   (ending{"mk_sd_data_tbl: non-SD type - internal error", LINE, 1}));

@@ -8,12 +8,12 @@ using namespace from_source;
 
 template <class Record> struct kind_row {
     stanza_id id;
-    Record cdgen::*record;
+    Record staging_records::*record;
     cdb_ref_t rsrc_class_t::*records;
     vx_uint32_t cb_id;
     void (*init)(cdgen &);
     void (*complete)(cdgen &);
-    vx_uint16_t cdgen::*vv_found;
+    vx_uint16_t valid_value_lists::*vv_found;
 
     std::string name() const {
         return sc_tables[id].sc_name;
@@ -24,16 +24,16 @@ using pattr_row = kind_row<rsrc_pattr_t>;
 using dattr_row = kind_row<rsrc_dattr_t>;
 
 const pattr_row PATTRS[] = {
-    {SC_PERSISTENT_RESOURCE_ATTRIBUTE, &cdgen::cb_rsrc_pattr, &rsrc_class_t::u_rc_pattrs, 0x43444239, init_pattr_tbl,
-     cmplt_pattr_tbl, &cdgen::pattr_vv_found},
-    {SC_PERSISTENT_CLASS_ATTRIBUTE, &cdgen::cb_rsrc_pattrC, &rsrc_class_t::u_rc_pattrsC, 0x43444237, init_pattrC_tbl,
-     cmplt_pattrC_tbl, &cdgen::pattrC_vv_found},
+    {SC_PERSISTENT_RESOURCE_ATTRIBUTE, &staging_records::cb_rsrc_pattr, &rsrc_class_t::u_rc_pattrs, 0x43444239,
+     init_pattr_tbl, cmplt_pattr_tbl, &valid_value_lists::pattr_vv_found},
+    {SC_PERSISTENT_CLASS_ATTRIBUTE, &staging_records::cb_rsrc_pattrC, &rsrc_class_t::u_rc_pattrsC, 0x43444237,
+     init_pattrC_tbl, cmplt_pattrC_tbl, &valid_value_lists::pattrC_vv_found},
 };
 const dattr_row DATTRS[] = {
-    {SC_DYNAMIC_RESOURCE_ATTRIBUTE, &cdgen::cb_rsrc_dattr, &rsrc_class_t::u_rc_dattrs, 0x43444261, init_dattr_tbl,
-     cmplt_dattr_tbl, &cdgen::dattr_vv_found},
-    {SC_DYNAMIC_CLASS_ATTRIBUTE, &cdgen::cb_rsrc_dattrC, &rsrc_class_t::u_rc_dattrsC, 0x43444238, init_dattrC_tbl,
-     cmplt_dattrC_tbl, &cdgen::dattrC_vv_found},
+    {SC_DYNAMIC_RESOURCE_ATTRIBUTE, &staging_records::cb_rsrc_dattr, &rsrc_class_t::u_rc_dattrs, 0x43444261,
+     init_dattr_tbl, cmplt_dattr_tbl, &valid_value_lists::dattr_vv_found},
+    {SC_DYNAMIC_CLASS_ATTRIBUTE, &staging_records::cb_rsrc_dattrC, &rsrc_class_t::u_rc_dattrsC, 0x43444238,
+     init_dattrC_tbl, cmplt_dattrC_tbl, &valid_value_lists::dattrC_vv_found},
 };
 const pattr_row &P = PATTRS[0], &PC = PATTRS[1];
 const dattr_row &D = DATTRS[0], &DC = DATTRS[1];
@@ -44,7 +44,7 @@ template <class Record> Record completed(compilation &c, const kind_row<Record> 
     kind.complete(c.cx);
     auto records = c.filed<Record>(kind.records);
     EXPECT_EQ(records.size(), 1U);
-    EXPECT_EQ((c.cx.*kind.record).ra_cb_ID, 0U);
+    EXPECT_EQ((c.cx.staged.*kind.record).ra_cb_ID, 0U);
     return records[0];
 }
 
@@ -67,10 +67,10 @@ TEST(PersistentAttribute, OpensAsEmptyRecord) {
     for (const pattr_row &kind : PATTRS) {
         compilation c;
         init_class_tbl(c.cx);
-        mk_vty_sec(c.cx);                    /* another list before its own */
-        (c.cx.*kind.record).ra_group_id = 3; /* of an earlier one */
-        c.cx.vvdisp = 0;
-        c.cx.*kind.vv_found = 1;
+        mk_vty_sec(c.cx);                           /* another list before its own */
+        (c.cx.staged.*kind.record).ra_group_id = 3; /* of an earlier one */
+        c.cx.valid_values.vvdisp = 0;
+        c.cx.valid_values.*kind.vv_found = 1;
         kind.init(c.cx);
         rsrc_pattr_t expected = {};
         expected.ra_cb_ID = kind.cb_id;
@@ -79,9 +79,9 @@ TEST(PersistentAttribute, OpensAsEmptyRecord) {
         if (&kind == &PC) /* deliberate: the other one at its completion */
             expected.u_ra_valid_vals = ABSENT;
         expected.ra_max_sd_idx = 0xFFFF;
-        EXPECT_EQ(bytes_of(c.cx.*kind.record), bytes_of(expected));
-        EXPECT_FALSE(c.cx.vvdisp.has_value());
-        EXPECT_EQ(c.cx.*kind.vv_found, 0U);
+        EXPECT_EQ(bytes_of(c.cx.staged.*kind.record), bytes_of(expected));
+        EXPECT_FALSE(c.cx.valid_values.vvdisp.has_value());
+        EXPECT_EQ(c.cx.valid_values.*kind.vv_found, 0U);
     }
 }
 
@@ -90,25 +90,25 @@ TEST(DynamicAttribute, OpensAsEmptyRecord) {
         compilation c;
         init_class_tbl(c.cx);
         mk_vty_sec(c.cx);
-        (c.cx.*kind.record).ra_group_id = 3;
-        c.cx.vvdisp = 0;
-        c.cx.*kind.vv_found = 1;
+        (c.cx.staged.*kind.record).ra_group_id = 3;
+        c.cx.valid_values.vvdisp = 0;
+        c.cx.valid_values.*kind.vv_found = 1;
         kind.init(c.cx);
         rsrc_dattr_t expected = {};
         expected.ra_cb_ID = kind.cb_id;
         expected.u_ra_variety_list = {{16, 0}};
         expected.u_ra_express = expected.u_ra_vclass = expected.u_ra_rearm_expr = expected.u_ra_sd = ABSENT;
         expected.ra_max_sd_idx = 0xFFFF;
-        EXPECT_EQ(bytes_of(c.cx.*kind.record), bytes_of(expected));
-        EXPECT_FALSE(c.cx.vvdisp.has_value());
-        EXPECT_EQ(c.cx.*kind.vv_found, 0U);
+        EXPECT_EQ(bytes_of(c.cx.staged.*kind.record), bytes_of(expected));
+        EXPECT_FALSE(c.cx.valid_values.vvdisp.has_value());
+        EXPECT_EQ(c.cx.valid_values.*kind.vv_found, 0U);
     }
 }
 
 template <class Record> void expect_class_needed(const kind_row<Record> &kind, const char *message) {
     opened c;
     for (auto step : {kind.init, kind.complete}) {
-        c.cx.cb_rsrc_class.rc_cb_ID = 0;
+        c.cx.staged.cb_rsrc_class.rc_cb_ID = 0;
         EXPECT_EQ(ending_of([&] { step(c.cx); }), (ending{message, LINE, 1}));
     }
     compilation nothing_open;
@@ -130,7 +130,7 @@ TEST(DynamicAttribute, NeedsAClass) {
 template <class Record> void expect_all_required_needed(const kind_row<Record> &kind, vx_uint32_t complete) {
     for (vx_uint32_t bit = 1; bit <= complete; bit <<= 1) {
         opened c;
-        (c.cx.*kind.record).ra_data_type = VX_INT32;
+        (c.cx.staged.*kind.record).ra_data_type = VX_INT32;
         c.state(kind.id).req_mask = complete & ~bit;
         for (auto step : {kind.init, kind.complete})
             EXPECT_EQ(ending_of([&] { step(c.cx); }), (ending{"Previous stanza incomplete", LINE, 1}));
@@ -155,7 +155,7 @@ TEST(DynamicAttribute, NeedsAllItsRequiredAttributes) {
     c.state(DC.id).req_mask = 0x3f;
     EXPECT_EQ(output_of([&] { cmplt_dattrC_tbl(c.cx); }), "scp->req_mask:         3f\nscp->req_mask_cmplt:   7f\n");
     c.state(DC.id).req_mask = 0x7f;
-    c.cx.cb_rsrc_dattrC.ra_data_type = VX_INT32;
+    c.cx.staged.cb_rsrc_dattrC.ra_data_type = VX_INT32;
     EXPECT_EQ(output_of([&] { cmplt_dattrC_tbl(c.cx); }), "");
 }
 
@@ -179,7 +179,7 @@ TEST(PersistentAttribute, HoldsWhatItsStanzaSays) {
         EXPECT_TRUE(is_absent(attr.u_ra_sd));
         EXPECT_EQ(attr.ra_max_sd_idx, 0xFFFFU);
         EXPECT_EQ(attr.ra_dflt_value.val_uint64, 0U);
-        EXPECT_EQ(c.cx.*kind.vv_found, 0U);
+        EXPECT_EQ(c.cx.valid_values.*kind.vv_found, 0U);
     }
 }
 
@@ -212,7 +212,7 @@ TEST(DynamicAttribute, HoldsWhatItsStanzaSays) {
         EXPECT_EQ(attr.ra_data_type, VX_INT32);
         EXPECT_EQ(attr.ra_var_type, ORB_QUANTITY);
         EXPECT_TRUE(is_absent(attr.u_ra_sd));
-        EXPECT_EQ(c.cx.*kind.vv_found, 0U);
+        EXPECT_EQ(c.cx.valid_values.*kind.vv_found, 0U);
     }
 }
 
@@ -264,8 +264,8 @@ template <class Record> void expect_no_group_unless_given(const kind_row<Record>
         {{}, {255, 0}}, {{"Properties=Public"}, {255, 0}}, {{"GroupID=0"}, {0, 0}}, {{"GroupName=9"}, {255, 9}}};
     for (const auto &[given, group] : rows) {
         opened c;
-        (c.cx.*kind.record).ra_data_type = VX_INT32;
-        (c.cx.*kind.record).ra_group_id = (c.cx.*kind.record).ra_group_msgid = 5;
+        (c.cx.staged.*kind.record).ra_data_type = VX_INT32;
+        (c.cx.staged.*kind.record).ra_group_id = (c.cx.staged.*kind.record).ra_group_msgid = 5;
         c.require_nothing(kind.id);
         for (const std::string &line : given)
             EXPECT_EQ(fed(c, kind.id, line), WELL);
@@ -394,17 +394,17 @@ TEST(DynamicAttribute, TypeWithoutBoundsHasNoneWhateverWasThere) {
     for (vx_data_type_t type : {VX_CHAR_PTR, VX_BINARY_PTR, VX_RSRC_HANDLE_PTR, VX_SD_PTR}) {
         opened c;
         c.require_nothing(D.id);
-        rsrc_dattr_t &attr = c.cx.cb_rsrc_dattr;
+        rsrc_dattr_t &attr = c.cx.staged.cb_rsrc_dattr;
         attr.ra_data_type = type;
         attr.ra_min_value.val_uint64 = attr.ra_max_value.val_uint64 = 0x123456789ABCDEF0;
         attr.u_ra_valid_vals = {{0, 5}};
-        c.cx.dattr_range_found = 1;
+        c.cx.range.dattr_range_found = 1;
         cmplt_dattr_tbl(c.cx);
         rsrc_dattr_t filed = c.filed<rsrc_dattr_t>(D.records)[0];
         EXPECT_EQ(filed.ra_min_value.val_uint64, NO_BOUND);
         EXPECT_EQ(filed.ra_max_value.val_uint64, NO_BOUND);
         EXPECT_TRUE(is_absent(filed.u_ra_valid_vals));
-        EXPECT_EQ(c.cx.dattr_range_found, 0U);
+        EXPECT_EQ(c.cx.range.dattr_range_found, 0U);
     }
 }
 
@@ -412,8 +412,8 @@ TEST(DynamicAttribute, TypeWithoutBoundsHasNoneWhateverWasThere) {
 template <class Record> ending completing(const kind_row<Record> &kind, int type, vx_uint16_t range_found) {
     opened c;
     c.require_nothing(kind.id);
-    (c.cx.*kind.record).ra_data_type = static_cast<vx_data_type_t>(type);
-    c.cx.dattr_range_found = range_found;
+    (c.cx.staged.*kind.record).ra_data_type = static_cast<vx_data_type_t>(type);
+    c.cx.range.dattr_range_found = range_found;
     return ending_of([&] { kind.complete(c.cx); });
 }
 
@@ -482,7 +482,7 @@ TEST(DynamicAttribute, ArraysInitialValueHasAllValues) {
     opened c;
     for (const char *line : {"DataType=Int64Array", "Range=1,2", "InitialValue=7", "InitialValue=9"})
         EXPECT_EQ(fed(c, DC.id, line), WELL);
-    c.cx.cb_rsrc_dattr.ra_cb_ID = 0; /* the range is the open resource attribute's */
+    c.cx.staged.cb_rsrc_dattr.ra_cb_ID = 0; /* the range is the open resource attribute's */
     cmplt_dattrC_tbl(c.cx);
     vx_uint32_t array = c.filed<rsrc_dattr_t>(DC.records)[0].ra_init_value.val_uint32;
     EXPECT_EQ(c.string_table_at<vx_uint32_t>(array), 2U);

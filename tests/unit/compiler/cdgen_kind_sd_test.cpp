@@ -18,23 +18,24 @@ const ending NO_CLASS = {"No class for SD Definition", LINE, 1};
 TEST(Element, NameIsAString) {
     opened c;
     add_to_tbl(c.cx, c.table(&rsrc_class_t::u_rc_strings), "before", 7);
-    c.cx.cb_sd_def.sd_fields[0].u_sd_field_name = {{1, 2}};
+    c.cx.staged.cb_sd_def.sd_fields[0].u_sd_field_name = {{1, 2}};
     EXPECT_EQ(fed(c, RESET, "ElementName=the name"), WELL);
-    EXPECT_EQ(c.cx.cb_sd_def.sd_fields[0].u_sd_field_name.offset[0], 8U);
-    EXPECT_EQ(c.cx.cb_sd_def.sd_fields[0].u_sd_field_name.offset[1], 0U);
+    EXPECT_EQ(c.cx.staged.cb_sd_def.sd_fields[0].u_sd_field_name.offset[0], 8U);
+    EXPECT_EQ(c.cx.staged.cb_sd_def.sd_fields[0].u_sd_field_name.offset[1], 0U);
     EXPECT_EQ(c.string_at(8), "the name");
 }
 
 TEST(Element, RemembersWhatItWasGiven) {
-    const std::pair<const char *, int cdgen::*> rows[] = {{"ElementName=x", &cdgen::sd_name_found},
-                                                          {"Description=1", &cdgen::sd_desc_found},
-                                                          {"DisplayName=1", &cdgen::sd_disp_found},
-                                                          {"DataType=Int32", &cdgen::sd_dt_found}};
+    const std::pair<const char *, int sd_element_state::*> rows[] = {
+        {"ElementName=x", &sd_element_state::sd_name_found},
+        {"Description=1", &sd_element_state::sd_desc_found},
+        {"DisplayName=1", &sd_element_state::sd_disp_found},
+        {"DataType=Int32", &sd_element_state::sd_dt_found}};
     for (const auto &row : rows) {
         opened c;
         EXPECT_EQ(fed(c, RESET, row.first), WELL);
         for (const auto &[line, found] : rows)
-            EXPECT_EQ(c.cx.*found, found == row.second ? 1 : 0) << line;
+            EXPECT_EQ(c.cx.sd.element.*found, found == row.second ? 1 : 0) << line;
     }
 }
 
@@ -42,11 +43,11 @@ TEST(Element, IndexesFollowOneAnother) {
     opened c;
     for (int i = 0; i < 3; ++i) {
         EXPECT_EQ(fed(c, RESET, "ElementIndex=" + std::to_string(i)), WELL);
-        EXPECT_EQ(c.cx.curr_sdeli, i);
-        EXPECT_EQ(c.cx.expected_sdeli, i + 1);
+        EXPECT_EQ(c.cx.sd.curr_sdeli, i);
+        EXPECT_EQ(c.cx.sd.expected_sdeli, i + 1);
     }
     EXPECT_EQ(fed(c, RESET, "ElementIndex=4294967299"), WELL); /* the low 32 bits */
-    EXPECT_EQ(c.cx.curr_sdeli, 3);
+    EXPECT_EQ(c.cx.sd.curr_sdeli, 3);
 }
 
 TEST(Element, IndexOutOfOrderIsShownAndRefused) {
@@ -83,10 +84,10 @@ TEST(Element, CannotBeStructuredItself) {
 
 TEST(Element, UnknownTypeIsTakenAsTypeZero) {
     opened c;
-    c.cx.cb_sd_def.sd_fields[0].sd_field_type = VX_INT32;
+    c.cx.staged.cb_sd_def.sd_fields[0].sd_field_type = VX_INT32;
     EXPECT_EQ(fed(c, RESET, "DataType=Nonsense"), WELL);
-    EXPECT_EQ(c.cx.cb_sd_def.sd_fields[0].sd_field_type, VX_UNKNOWN);
-    EXPECT_EQ(c.cx.sd_dt_found, 1);
+    EXPECT_EQ(c.cx.staged.cb_sd_def.sd_fields[0].sd_field_type, VX_UNKNOWN);
+    EXPECT_EQ(c.cx.sd.element.sd_dt_found, 1);
 }
 
 TEST(Element, DefaultValueIsRefused) {
@@ -97,16 +98,16 @@ TEST(Element, DefaultValueIsRefused) {
 TEST(Element, ValidValuesAreAListOfItsType) {
     opened c;
     mk_vv_sec(c.cx); /* another list before it */
-    c.cx.cb_sd_def.sd_fields[0].u_sd_valid_vals = {{1, 2}};
+    c.cx.staged.cb_sd_def.sd_fields[0].u_sd_valid_vals = {{1, 2}};
     EXPECT_EQ(fed(c, RESET, "DataType=Int64Array"), WELL);
     EXPECT_EQ(fed(c, RESET, "ValueDisplayName=5"), (ending{"No ValidValue to attach ValueDisplayName to.", LINE, 1}));
     for (const char *line : {"ValidValue=7", "ValueDisplayName=5", "ValidValue=8,9", "ValueDisplayName=6"})
         EXPECT_EQ(fed(c, RESET, line), WELL);
     EXPECT_EQ(fed(c, RESET, "ValidValue=x"), INVALID);
-    const cdb_ref_t &list = c.cx.cb_sd_def.sd_fields[0].u_sd_valid_vals;
+    const cdb_ref_t &list = c.cx.staged.cb_sd_def.sd_fields[0].u_sd_valid_vals;
     EXPECT_EQ(list.offset[0], 32U);
     EXPECT_EQ(list.offset[1], 0U);
-    EXPECT_EQ(c.cx.sd_vv_found, 1);
+    EXPECT_EQ(c.cx.sd.element.sd_vv_found, 1);
     std::vector<vv_entry_t> values = c.valid_values_at(list);
     ASSERT_EQ(values.size(), 2U);
     EXPECT_EQ(values[0].vv_low_val.val_int64, 7);
@@ -120,12 +121,12 @@ TEST(Element, ValidValuesAreAListOfItsType) {
 TEST(Element, TypeIsCollectedForAnAttributesValueOnly) {
     compilation of_class, of_attribute;
     of_class.read(CLASS + element("ResetSDDefinition", 0, "Int32"));
-    EXPECT_EQ(of_class.cx.sd_num_elems, 0U);
-    EXPECT_EQ(of_class.cx.stanzas[RESET].dflt.tbl, nullptr);
+    EXPECT_EQ(of_class.cx.sd.sd_num_elems, 0U);
+    EXPECT_EQ(of_class.cx.framing.stanzas[RESET].dflt.tbl, nullptr);
     of_attribute.read(CLASS + pattr(P, "SD") + element("PAttrSDDefinition", 0, "Int32") +
                       element("PAttrSDDefinition", 1, "StringArray"));
-    EXPECT_EQ(of_attribute.cx.sd_num_elems, 2U);
-    const dflt_tbl &types = of_attribute.cx.stanzas[SC_PATTR_SD_DEFINITION].dflt;
+    EXPECT_EQ(of_attribute.cx.sd.sd_num_elems, 2U);
+    const dflt_tbl &types = of_attribute.cx.framing.stanzas[SC_PATTR_SD_DEFINITION].dflt;
     EXPECT_EQ(types.num_elems, 2U);
     auto cells = records_of<vx_value_t>(&types.tbl->cells);
     ASSERT_EQ(cells.size(), 2U);
@@ -138,20 +139,20 @@ TEST(Element, TypeIsCollectedForAnAttributesValueOnly) {
 TEST(Element, OpensAsEmptyRecord) {
     compilation c;
     init_class_tbl(c.cx);
-    c.cx.cb_sd_def.sd_fields[0].sd_dscr_msgid = 3;
-    c.cx.vvdisp = 0;
-    c.cx.sd_vv_found = 1;
+    c.cx.staged.cb_sd_def.sd_fields[0].sd_dscr_msgid = 3;
+    c.cx.valid_values.vvdisp = 0;
+    c.cx.sd.element.sd_vv_found = 1;
     init_sd_tbl(c.cx);
-    std::string staged(reinterpret_cast<const char *>(&c.cx.cb_sd_def), sizeof(sd_def_t));
+    std::string staged(reinterpret_cast<const char *>(&c.cx.staged.cb_sd_def), sizeof(sd_def_t));
     EXPECT_EQ(staged, number(0x43444266, 4) + std::string(36, '\0'));
-    EXPECT_FALSE(c.cx.vvdisp.has_value());
-    EXPECT_EQ(c.cx.sd_vv_found, 0);
+    EXPECT_FALSE(c.cx.valid_values.vvdisp.has_value());
+    EXPECT_EQ(c.cx.sd.element.sd_vv_found, 0);
     EXPECT_EQ(c.table(&rsrc_class_t::u_rc_sd_defs)->used(), 0U); /* nothing was open */
 }
 
 TEST(Element, NeedsAClass) {
     opened c;
-    c.cx.cb_rsrc_class.rc_cb_ID = 0;
+    c.cx.staged.cb_rsrc_class.rc_cb_ID = 0;
     EXPECT_EQ(ending_of([&] { init_sd_tbl(c.cx); }), NO_CLASS);
     EXPECT_EQ(ending_of([&] { cmplt_sd_tbl(c.cx, &sc_tables[RESET]); }), NO_CLASS);
     EXPECT_EQ(compilation().reading("#\nOnlineSDDefinition\n"), (ending{"No class for SD Definition", 2, 1}));
@@ -159,28 +160,32 @@ TEST(Element, NeedsAClass) {
 
 /* An element that was given all it needs, of a run of the class. */
 void give_all(opened &c) {
-    c.cx.sd_name_found = c.cx.sd_desc_found = c.cx.sd_disp_found = c.cx.sd_dt_found = 1;
-    c.cx.curr_sd_tbl = &c.cx.cb_rsrc_class.u_rc_reset_input;
-    c.cx.curr_sd_tbl->offset[0] = mk_sd_sec(c.cx);
+    c.cx.sd.element.sd_name_found = c.cx.sd.element.sd_desc_found = c.cx.sd.element.sd_disp_found =
+        c.cx.sd.element.sd_dt_found = 1;
+    c.cx.sd.curr_sd_tbl = &c.cx.staged.cb_rsrc_class.u_rc_reset_input;
+    c.cx.sd.curr_sd_tbl->offset[0] = mk_sd_sec(c.cx);
 }
 
 TEST(Element, NeedsNameTypeAndBothMessages) {
-    for (auto found : {&cdgen::sd_name_found, &cdgen::sd_desc_found, &cdgen::sd_disp_found, &cdgen::sd_dt_found}) {
+    for (auto found : {&sd_element_state::sd_name_found, &sd_element_state::sd_desc_found,
+                       &sd_element_state::sd_disp_found, &sd_element_state::sd_dt_found}) {
         opened c;
         give_all(c);
-        c.cx.*found = 0;
+        c.cx.sd.element.*found = 0;
         EXPECT_EQ(ending_of([&] { init_sd_tbl(c.cx); }), INCOMPLETE);
         EXPECT_EQ(ending_of([&] { cmplt_sd_tbl(c.cx, &sc_tables[RESET]); }), INCOMPLETE);
-        c.cx.*found = 1;
+        c.cx.sd.element.*found = 1;
         EXPECT_EQ(ending_of([&] { init_sd_tbl(c.cx); }), WELL);
-        EXPECT_EQ(c.cx.sd_name_found + c.cx.sd_desc_found + c.cx.sd_disp_found + c.cx.sd_dt_found, 0);
+        EXPECT_EQ(c.cx.sd.element.sd_name_found + c.cx.sd.element.sd_desc_found + c.cx.sd.element.sd_disp_found +
+                      c.cx.sd.element.sd_dt_found,
+                  0);
     }
 }
 
 TEST(Element, NeedsTheClassesTable) {
     opened c;
     give_all(c);
-    c.cx.cb_rsrc_class.u_rc_sd_defs = {};
+    c.cx.staged.cb_rsrc_class.u_rc_sd_defs = {};
     EXPECT_EQ(ending_of([&] { init_sd_tbl(c.cx); }), (ending{"No Class SD table for SD Definition", LINE, 1}));
 }
 
@@ -188,7 +193,7 @@ TEST(Element, NeedsNoIndex) {
     compilation c;
     c.read(CLASS + stanza("ResetSDDefinition", {"ElementName=x", "Description=1", "DisplayName=2", "DataType=Int32"}) +
            "ResourceClass\n");
-    EXPECT_EQ(c.elements_at(c.cx.cb_rsrc_class.u_rc_reset_input).size(), 1U);
+    EXPECT_EQ(c.elements_at(c.cx.staged.cb_rsrc_class.u_rc_reset_input).size(), 1U);
 }
 
 TEST(Element, IsFiledWithWhatItWasGiven) {
@@ -197,7 +202,7 @@ TEST(Element, IsFiledWithWhatItWasGiven) {
            stanza("ResetSDDefinition", {"ElementName=Second", "Description=51", "DisplayName=52", "ElementIndex=1",
                                         "DataType=StringArray"}) +
            "ResourceClass\n");
-    std::vector<sd_field_t> elements = c.elements_at(c.cx.cb_rsrc_class.u_rc_reset_input);
+    std::vector<sd_field_t> elements = c.elements_at(c.cx.staged.cb_rsrc_class.u_rc_reset_input);
     ASSERT_EQ(elements.size(), 2U);
     EXPECT_EQ(c.string_at(elements[0].u_sd_field_name.offset[0]), "E");
     EXPECT_EQ(elements[0].sd_field_type, VX_FLOAT32);
@@ -220,16 +225,16 @@ TEST(Element, IsFiledWithWhatItWasGiven) {
 TEST(Element, IsFiledByWhatFollows) {
     compilation c;
     c.read(CLASS + element("ResetSDDefinition", 0, "Int32"));
-    EXPECT_EQ(c.elements_at(c.cx.cb_rsrc_class.u_rc_reset_input).size(), 0U);
+    EXPECT_EQ(c.elements_at(c.cx.staged.cb_rsrc_class.u_rc_reset_input).size(), 0U);
     c.read(element("ResetSDDefinition", 1, "Int32"));
-    EXPECT_EQ(c.elements_at(c.cx.cb_rsrc_class.u_rc_reset_input).size(), 1U);
-    EXPECT_EQ(c.cx.curr_sdeli, 1);
-    EXPECT_EQ(c.cx.expected_sdeli, 2);
-    cmplt_sd_tbl(c.cx, c.cx.curr_sd_scp);
-    EXPECT_EQ(c.elements_at(c.cx.cb_rsrc_class.u_rc_reset_input).size(), 2U);
-    EXPECT_EQ(c.cx.cb_sd_def.sd_cb_ID, 0U);
-    EXPECT_EQ(c.cx.curr_sdeli, -1);
-    EXPECT_EQ(c.cx.expected_sdeli, 0);
+    EXPECT_EQ(c.elements_at(c.cx.staged.cb_rsrc_class.u_rc_reset_input).size(), 1U);
+    EXPECT_EQ(c.cx.sd.curr_sdeli, 1);
+    EXPECT_EQ(c.cx.sd.expected_sdeli, 2);
+    cmplt_sd_tbl(c.cx, c.cx.framing.curr_sd_scp);
+    EXPECT_EQ(c.elements_at(c.cx.staged.cb_rsrc_class.u_rc_reset_input).size(), 2U);
+    EXPECT_EQ(c.cx.staged.cb_sd_def.sd_cb_ID, 0U);
+    EXPECT_EQ(c.cx.sd.curr_sdeli, -1);
+    EXPECT_EQ(c.cx.sd.expected_sdeli, 0);
 }
 
 /* The table grows several times meanwhile. */
@@ -240,7 +245,7 @@ TEST(Element, StandsBehindTheOnesBefore) {
         text += stanza("OnlineSDDefinition", {"ElementName=N", "Description=" + std::to_string(i), "DisplayName=1",
                                               "ElementIndex=" + std::to_string(i), "DataType=Int32"});
     c.read(text + "ResourceClass\n");
-    std::vector<sd_field_t> elements = c.elements_at(c.cx.cb_rsrc_class.u_rc_online_input);
+    std::vector<sd_field_t> elements = c.elements_at(c.cx.staged.cb_rsrc_class.u_rc_online_input);
     ASSERT_EQ(elements.size(), 100U);
     for (size_t i = 0; i < 100; ++i)
         EXPECT_EQ(elements[i].sd_dscr_msgid, i);
@@ -266,9 +271,9 @@ TEST(Run, OfTheClassBelongsToItsField) {
     c.read(text + "ResourceClass\n");
     vx_uint32_t section = 0;
     for (auto [kind, field] : CLASS_OWNERS) {
-        EXPECT_EQ((c.cx.cb_rsrc_class.*field).offset[0], section) << kind;
-        EXPECT_EQ((c.cx.cb_rsrc_class.*field).offset[1], 0U) << kind;
-        EXPECT_EQ(c.elements_at(c.cx.cb_rsrc_class.*field).size(), 3U) << kind;
+        EXPECT_EQ((c.cx.staged.cb_rsrc_class.*field).offset[0], section) << kind;
+        EXPECT_EQ((c.cx.staged.cb_rsrc_class.*field).offset[1], 0U) << kind;
+        EXPECT_EQ(c.elements_at(c.cx.staged.cb_rsrc_class.*field).size(), 3U) << kind;
         section += 8 + 3 * 32;
     }
 }
@@ -298,10 +303,10 @@ TEST(Run, OfAnActionGoesToAnOpenClassActionFirst) {
     init_action_tbl(c.cx);
     init_actionC_tbl(c.cx);
     c.read(element("ActionInSDDefinition", 0, "Int32") + element("ActionOutSDDefinition", 0, "Int32"));
-    EXPECT_EQ(c.cx.cb_rsrc_actionC.u_ac_sd_input.offset[0], 0U);
-    EXPECT_EQ(c.cx.cb_rsrc_actionC.u_ac_sd_resp.offset[0], 40U);
-    EXPECT_TRUE(is_absent(c.cx.cb_rsrc_action.u_ac_sd_input));
-    EXPECT_TRUE(is_absent(c.cx.cb_rsrc_action.u_ac_sd_resp));
+    EXPECT_EQ(c.cx.staged.cb_rsrc_actionC.u_ac_sd_input.offset[0], 0U);
+    EXPECT_EQ(c.cx.staged.cb_rsrc_actionC.u_ac_sd_resp.offset[0], 40U);
+    EXPECT_TRUE(is_absent(c.cx.staged.cb_rsrc_action.u_ac_sd_input));
+    EXPECT_TRUE(is_absent(c.cx.staged.cb_rsrc_action.u_ac_sd_resp));
 }
 
 TEST(Run, OfNoActionBelongsToNothing) {
@@ -317,9 +322,9 @@ TEST(Run, OfTheClassLeavesTheAttributeBeforeItAlone) {
         c.read(CLASS + pattr(P, "SD"));
         c.read(between);
         c.read(element("OnlineSDDefinition", 0, "Int32") + stanza("ResourceClass"));
-        EXPECT_EQ(c.elements_at(c.cx.cb_rsrc_class.u_rc_online_input).size(), 1U);
-        EXPECT_EQ(is_absent(c.cx.cb_rsrc_pattr.u_ra_sd), between.empty());
-        EXPECT_EQ(c.cx.cb_rsrc_pattr.ra_max_sd_idx, between.empty() ? 0xFFFFU : 0U);
+        EXPECT_EQ(c.elements_at(c.cx.staged.cb_rsrc_class.u_rc_online_input).size(), 1U);
+        EXPECT_EQ(is_absent(c.cx.staged.cb_rsrc_pattr.u_ra_sd), between.empty());
+        EXPECT_EQ(c.cx.staged.cb_rsrc_pattr.ra_max_sd_idx, between.empty() ? 0xFFFFU : 0U);
     }
 }
 
@@ -327,8 +332,8 @@ TEST(Run, SecondOneOfAKindTakesTheOwner) {
     compilation c;
     c.read(CLASS + element("ResetSDDefinition", 0, "Int32") + "ResourceClass\n" +
            element("ResetSDDefinition", 0, "Int32") + element("ResetSDDefinition", 1, "Int32") + "ResourceClass\n");
-    EXPECT_EQ(c.cx.cb_rsrc_class.u_rc_reset_input.offset[0], 40U);
-    EXPECT_EQ(c.elements_at(c.cx.cb_rsrc_class.u_rc_reset_input).size(), 2U);
+    EXPECT_EQ(c.cx.staged.cb_rsrc_class.u_rc_reset_input.offset[0], 40U);
+    EXPECT_EQ(c.elements_at(c.cx.staged.cb_rsrc_class.u_rc_reset_input).size(), 2U);
 }
 
 /* ---- Values of attributes -------------------------------------------------------------------------------------- */
@@ -381,9 +386,9 @@ TEST(Run, MayBeOfTheOtherAttributeKind) {
     compilation c;
     c.read(CLASS + dattr("DynamicResourceAttribute", "SD") + element("PAttrSDDefinition", 0, "Int32") +
            "ResourceClass\n");
-    EXPECT_EQ(c.cx.cb_rsrc_dattr.ra_max_sd_idx, 0U);
-    EXPECT_EQ(c.elements_at(c.cx.cb_rsrc_dattr.u_ra_sd).size(), 1U);
-    EXPECT_EQ(c.string_table_at<vx_uint32_t>(c.cx.cb_rsrc_dattr.ra_init_value.val_uint32), 1U);
+    EXPECT_EQ(c.cx.staged.cb_rsrc_dattr.ra_max_sd_idx, 0U);
+    EXPECT_EQ(c.elements_at(c.cx.staged.cb_rsrc_dattr.u_ra_sd).size(), 1U);
+    EXPECT_EQ(c.string_table_at<vx_uint32_t>(c.cx.staged.cb_rsrc_dattr.ra_init_value.val_uint32), 1U);
 }
 
 /* Types are collected since the attribute's line; a run's value takes as many of them as the run has elements. */
@@ -391,7 +396,7 @@ TEST(Run, SecondOneOfAnAttributeTakesTheAttribute) {
     compilation c;
     c.read(CLASS + pattr(P, "SD") + element("PAttrSDDefinition", 0, "Int32") +
            element("PAttrSDDefinition", 1, "UInt32") + element("DAttrSDDefinition", 0, "Float32") + "ResourceClass\n");
-    const rsrc_pattr_t &attr = c.cx.cb_rsrc_pattr;
+    const rsrc_pattr_t &attr = c.cx.staged.cb_rsrc_pattr;
     EXPECT_EQ(attr.u_ra_sd.offset[0], 72U);
     EXPECT_EQ(c.elements_at(attr.u_ra_sd).size(), 1U);
     EXPECT_EQ(attr.ra_max_sd_idx, 0U);
@@ -404,7 +409,7 @@ TEST(Run, SecondOneOfAnAttributeTakesTheAttribute) {
 TEST(Run, AtTheEndOfTheSourceComesAfterItsAttribute) {
     compilation c;
     c.compile_all(CLASS + MAP + pattr(P, "SD") + element("PAttrSDDefinition", 0, "Int32"));
-    const rsrc_class_t &filed = records_of<rsrc_class_t>(&c.cx.rsrc_class_tbl)[0];
+    const rsrc_class_t &filed = records_of<rsrc_class_t>(&c.cx.sections.rsrc_class_tbl)[0];
     const rsrc_pattr_t &attr = records_of<rsrc_pattr_t>(staged_content(filed.u_rc_pattrs))[0];
     EXPECT_EQ(attr.u_ra_sd.offset[0], 0U);
     EXPECT_EQ(attr.ra_max_sd_idx, 0xFFFFU);
@@ -488,7 +493,7 @@ TEST(CollectedValues, MustBeOfATypeThatCanBeCopied) {
         tbl strings(64, "strings");
         vx_value_t value = {.val_uint64 = 0};
         dflt_tbl unknown = collected(c.cx, {0});
-        c.cx.sd_attr_type = sd_attr_type;
+        c.cx.sd.sd_attr_type = sd_attr_type;
         EXPECT_EQ(ending_of([&, type = type] { dump_dflt(c.cx, &strings, &unknown, &value, type); }),
                   (ending{message, LINE, 1}));
     }

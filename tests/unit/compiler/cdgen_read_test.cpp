@@ -69,16 +69,16 @@ TEST(Reader, CommentEndsWithItsLine) {
 TEST(Reader, LastLineNeedsNoNewline) {
     compilation c;
     c.read("ControlDefinition\n\tFileVersion=1.2.3.4");
-    EXPECT_EQ(c.cx.cb_rsrc_class.rc_version, 0x01020304U);
-    EXPECT_EQ(c.cx.linenum, 2);
+    EXPECT_EQ(c.cx.staged.cb_rsrc_class.rc_version, 0x01020304U);
+    EXPECT_EQ(c.cx.source.linenum, 2);
     EXPECT_EQ(compilation().reading("\n\nX"), (ending{"Invalid table name: X", 3, 1}));
 }
 
 TEST(Reader, SourceMayBeEmpty) {
     compilation c;
     EXPECT_EQ(c.reading(""), WELL);
-    EXPECT_EQ(c.cx.linenum, 0);
-    EXPECT_EQ(c.cx.scp, nullptr);
+    EXPECT_EQ(c.cx.source.linenum, 0);
+    EXPECT_EQ(c.cx.framing.scp, nullptr);
 }
 
 /* A read takes 254 characters, the newline among them; each one counts. */
@@ -103,8 +103,8 @@ TEST(Reader, LongValueIsCutWhereItsReadEnds) {
     std::string start = "\tMessageCatalog=";
     std::string fits(254 - start.size(), 'm');
     EXPECT_EQ(c.reading("ClassToManagerMapping\n" + start + fits + "X\n"), (ending{"Invalid table name: X", 3, 1}));
-    const auto *strings = staged_tbl(c.cx.cb_rsrc_cmmap.u_rcm_strings)->tbl_base;
-    EXPECT_EQ(strings + c.cx.cb_rsrc_cmmap.u_rcm_msg_file.offset[0], fits);
+    const auto *strings = staged_tbl(c.cx.staged.cb_rsrc_cmmap.u_rcm_strings)->tbl_base;
+    EXPECT_EQ(strings + c.cx.staged.cb_rsrc_cmmap.u_rcm_msg_file.offset[0], fits);
 }
 
 /* The source comes in pieces that know nothing of lines, nor of comments and quotes. */
@@ -112,15 +112,15 @@ TEST(Reader, LineMayStandAcrossPiecesOfTheFile) {
     for (size_t blank = 65536 - 60; blank <= 65536; ++blank) {
         compilation c;
         c.read(std::string(blank, '\n') + "ControlDefinition # X\n\tFileVersion=\"1.2.3.4\" // Y\n");
-        ASSERT_EQ(c.cx.cb_rsrc_class.rc_version, 0x01020304U) << blank;
-        ASSERT_EQ(c.cx.linenum, static_cast<int>(blank) + 2);
+        ASSERT_EQ(c.cx.staged.cb_rsrc_class.rc_version, 0x01020304U) << blank;
+        ASSERT_EQ(c.cx.source.linenum, static_cast<int>(blank) + 2);
     }
 }
 
 TEST(Reader, LineNumberStopsAtTheLargest) {
     constexpr int LARGEST = std::numeric_limits<int>::max();
     compilation c;
-    c.cx.linenum = LARGEST - 1;
+    c.cx.source.linenum = LARGEST - 1;
     EXPECT_EQ(c.reading("\n\n\nX\n"), (ending{"Invalid table name: X", LARGEST, 1}));
 }
 
@@ -137,18 +137,18 @@ TEST(Reader, FileThatCannotBeRead) {
     compilation c;
     c.read("");
     c.source = std::filesystem::path(c.output).parent_path();
-    c.cx.cdefsrc = c.source.c_str();
-    EXPECT_EQ(ending_of([&] { cache_input_data(c.cx, c.cx.cdefsrc); }),
+    c.cx.options.cdefsrc = c.source.c_str();
+    EXPECT_EQ(ending_of([&] { cache_input_data(c.cx, c.cx.options.cdefsrc); }),
               (ending{c.source + ": cannot read because: Is a directory", 0, EISDIR}));
-    EXPECT_EQ(c.cx.cdb_fp.fd, -1);
+    EXPECT_EQ(c.cx.source.cdb_fp.fd, -1);
 }
 
 TEST(Reader, FileIsClosedAtItsEndAndAfterAFailure) {
     compilation well, ill;
     well.read(CLASS);
-    EXPECT_EQ(well.cx.cdb_fp.fd, -1);
+    EXPECT_EQ(well.cx.source.cdb_fp.fd, -1);
     EXPECT_NE(ill.reading("X\n"), WELL);
-    EXPECT_EQ(ill.cx.cdb_fp.fd, -1);
+    EXPECT_EQ(ill.cx.source.cdb_fp.fd, -1);
 }
 
 /* ---- Headers --------------------------------------------------------------------------------------------------- */
@@ -158,8 +158,8 @@ TEST(Reader, HeaderMayBeFollowedByBlanksAndAComment) {
                             "ControlDefinition#", "ControlDefinition // X", "ControlDefinition/* X"}) {
         compilation c;
         c.read(row);
-        EXPECT_EQ(c.cx.table_id, SC_CONTROL_DEFINITION) << row;
-        EXPECT_EQ(c.cx.cb_rsrc_class.rc_cb_ID, 0x43444231U) << row;
+        EXPECT_EQ(c.cx.framing.table_id, SC_CONTROL_DEFINITION) << row;
+        EXPECT_EQ(c.cx.staged.cb_rsrc_class.rc_cb_ID, 0x43444231U) << row;
     }
 }
 
@@ -190,21 +190,21 @@ TEST(Reader, EveryKindHasAHeader) {
         std::string before = is_attr_SD(id) != nullptr ? pattr("PersistentClassAttribute", "SD") : "";
         c.read(CLASS);
         c.read(before + stanza(header));
-        EXPECT_EQ(c.cx.table_id, id);
-        EXPECT_EQ(c.cx.scp, &sc_tables[static_cast<size_t>(id)]);
-        EXPECT_EQ(c.cx.curr_sd_scp, c.cx.scp);
+        EXPECT_EQ(c.cx.framing.table_id, id);
+        EXPECT_EQ(c.cx.framing.scp, &sc_tables[static_cast<size_t>(id)]);
+        EXPECT_EQ(c.cx.framing.curr_sd_scp, c.cx.framing.scp);
     }
 }
 
 TEST(Reader, HeaderRemembersThePreviousKind) {
     compilation c;
     c.read(CLASS);
-    EXPECT_EQ(c.cx.prev_scp, nullptr);
+    EXPECT_EQ(c.cx.framing.prev_scp, nullptr);
     c.read(class_values());
-    EXPECT_EQ(c.cx.prev_scp, &sc_tables[SC_CONTROL_DEFINITION]);
+    EXPECT_EQ(c.cx.framing.prev_scp, &sc_tables[SC_CONTROL_DEFINITION]);
     c.read(MAP);
-    EXPECT_EQ(c.cx.prev_scp, &sc_tables[SC_RESOURCE_CLASS]);
-    EXPECT_EQ(c.cx.scp, &sc_tables[SC_CLASS_TO_MANAGER_MAPPING]);
+    EXPECT_EQ(c.cx.framing.prev_scp, &sc_tables[SC_RESOURCE_CLASS]);
+    EXPECT_EQ(c.cx.framing.scp, &sc_tables[SC_CLASS_TO_MANAGER_MAPPING]);
 }
 
 TEST(Reader, HeaderForgetsWhatTheKindsLastStanzaHad) {
@@ -212,7 +212,7 @@ TEST(Reader, HeaderForgetsWhatTheKindsLastStanzaHad) {
         compilation c;
         std::string name = sc_tables[kind].sc_name;
         c.read(CLASS + pattr(name, "Int32", {"GroupID=1", "DefaultValue=3"}));
-        stanza_state &state = c.cx.stanzas[kind];
+        stanza_state &state = c.cx.framing.stanzas[kind];
         EXPECT_EQ(state.req_mask, 0x3fU);
         EXPECT_EQ(state.opt_mask, 0x80000009U);
         EXPECT_EQ(state.dflt.num_elems, 1U);
@@ -228,7 +228,7 @@ TEST(Reader, HeaderKeepsWhatOtherKindsHave) {
     compilation c;
     c.read(CLASS + pattr("PersistentResourceAttribute", "Int32", {"GroupID=1", "DefaultValue=3"}) +
            "PersistentClassAttribute\n");
-    const stanza_state &state = c.cx.stanzas[SC_PERSISTENT_RESOURCE_ATTRIBUTE];
+    const stanza_state &state = c.cx.framing.stanzas[SC_PERSISTENT_RESOURCE_ATTRIBUTE];
     EXPECT_EQ(state.req_mask, 0x3fU);
     EXPECT_EQ(state.opt_mask, 0x80000009U);
     EXPECT_EQ(state.dflt.num_elems, 1U);
@@ -303,13 +303,13 @@ TEST(Reader, IncompleteStanzaIsReportedAtTheHeaderThatClosesIt) {
 TEST(Reader, PlainHeaderForgetsTheStructuredAttribute) {
     compilation c;
     c.read(CLASS + pattr("PersistentResourceAttribute", "SD"));
-    EXPECT_EQ(c.cx.attr_dflt_val, &c.cx.cb_rsrc_pattr.ra_dflt_value);
-    EXPECT_EQ(c.cx.curr_sd_tbl, &c.cx.cb_rsrc_pattr.u_ra_sd);
-    EXPECT_EQ(c.cx.max_sd_idx, &c.cx.cb_rsrc_pattr.ra_max_sd_idx);
+    EXPECT_EQ(c.cx.sd.attr_dflt_val, &c.cx.staged.cb_rsrc_pattr.ra_dflt_value);
+    EXPECT_EQ(c.cx.sd.curr_sd_tbl, &c.cx.staged.cb_rsrc_pattr.u_ra_sd);
+    EXPECT_EQ(c.cx.sd.max_sd_idx, &c.cx.staged.cb_rsrc_pattr.ra_max_sd_idx);
     c.read("ResourceVariableClass\n");
-    EXPECT_EQ(c.cx.attr_dflt_val, nullptr);
-    EXPECT_EQ(c.cx.curr_sd_tbl, nullptr);
-    EXPECT_EQ(c.cx.max_sd_idx, nullptr);
+    EXPECT_EQ(c.cx.sd.attr_dflt_val, nullptr);
+    EXPECT_EQ(c.cx.sd.curr_sd_tbl, nullptr);
+    EXPECT_EQ(c.cx.sd.max_sd_idx, nullptr);
 }
 
 TEST(Reader, AttributeRunMustFollowAnAttributeOfAnSdType) {
@@ -332,26 +332,26 @@ TEST(Reader, AttributeRunMustFollowAnAttributeOfAnSdType) {
 TEST(Reader, AttributeRunTakesOverTheAttributesCollection) {
     compilation c;
     c.read(CLASS + dattr("DynamicClassAttribute", "SDArray") + element("DAttrSDDefinition", 0, "Int32"));
-    const stanza_state &run = c.cx.stanzas[SC_DATTR_SD_DEFINITION];
+    const stanza_state &run = c.cx.framing.stanzas[SC_DATTR_SD_DEFINITION];
     EXPECT_NE(run.dflt.tbl, nullptr);
-    EXPECT_EQ(run.dflt.tbl, c.cx.stanzas[SC_DYNAMIC_CLASS_ATTRIBUTE].dflt.tbl);
+    EXPECT_EQ(run.dflt.tbl, c.cx.framing.stanzas[SC_DYNAMIC_CLASS_ATTRIBUTE].dflt.tbl);
     c.read(element("DAttrSDDefinition", 1, "Int32"));
     EXPECT_EQ(run.dflt.num_elems, 2U);
-    EXPECT_EQ(run.dflt.tbl, c.cx.stanzas[SC_DYNAMIC_CLASS_ATTRIBUTE].dflt.tbl);
+    EXPECT_EQ(run.dflt.tbl, c.cx.framing.stanzas[SC_DYNAMIC_CLASS_ATTRIBUTE].dflt.tbl);
 }
 
 TEST(Reader, PlainRunStartsWithoutACollection) {
     compilation c;
-    c.cx.stanzas[SC_RESET_SD_DEFINITION].dflt = {std::make_shared<dflt_values>("VX_SD_PTR"), 7};
+    c.cx.framing.stanzas[SC_RESET_SD_DEFINITION].dflt = {std::make_shared<dflt_values>("VX_SD_PTR"), 7};
     c.read(CLASS + "ResetSDDefinition\n");
-    EXPECT_EQ(c.cx.stanzas[SC_RESET_SD_DEFINITION].dflt.tbl, nullptr);
-    EXPECT_EQ(c.cx.stanzas[SC_RESET_SD_DEFINITION].dflt.num_elems, 0U);
+    EXPECT_EQ(c.cx.framing.stanzas[SC_RESET_SD_DEFINITION].dflt.tbl, nullptr);
+    EXPECT_EQ(c.cx.framing.stanzas[SC_RESET_SD_DEFINITION].dflt.num_elems, 0U);
 }
 
 TEST(Reader, EveryStructuredDataHeaderStartsTheMasksAnew) {
     compilation c;
     c.read(CLASS + element("ResetSDDefinition", 0, "Int32", {"ValidValue=1"}));
-    stanza_state &state = c.cx.stanzas[SC_RESET_SD_DEFINITION];
+    stanza_state &state = c.cx.framing.stanzas[SC_RESET_SD_DEFINITION];
     EXPECT_EQ(state.req_mask, 0x1fU);
     EXPECT_EQ(state.opt_mask, 0x80000002U);
     c.read("ResetSDDefinition\n");

@@ -170,7 +170,7 @@ TEST(SerialRefusals, StructuredTypesAreFatal) {
                               {VX_SBS_PTR, "VX_SBS_TYPE not supported"}})
         for (int mode : ALL_MODES) {
             serial s;
-            s.cx.linenum = 7;
+            s.cx.source.linenum = 7;
             auto end = ending_of([&, refused = type] { s.copy(nullptr, refused, mode, 1); });
             EXPECT_EQ(end, (ending{text, 0, 1})) << mode;
             EXPECT_EQ(s.added(), "") << mode;
@@ -213,7 +213,7 @@ const ending null_array = {"Attempt to write NULL array", 0, 1};
 
 TEST(SerialRefusals, ArraysWithoutCapacityAreFatal) {
     serial s;
-    s.cx.linenum = 7;
+    s.cx.source.linenum = 7;
     for (vx_uint32_t code = VX_INT32_ARRAY; code < VX_SD_PTR_ARRAY; ++code)
         EXPECT_EQ(ending_of([&] { s.copy(nullptr, type_of_code(code), DFLT_DEFAULT, 0); }), null_array) << code;
     tbl_anchor a, b;
@@ -386,7 +386,7 @@ TEST(StructuredData, RefusedElementIsCountedAndTyped) {
 TEST(StructuredData, OtherTypesAreFatal) {
     for (vx_uint32_t code = 0; code < 25; ++code) {
         serial s;
-        s.cx.linenum = 7;
+        s.cx.source.linenum = 7;
         auto end = ending_of([&] { s.copy_sd(VX_INT32, DFLT_DEFAULT, 1, type_of_code(code)); });
         bool structured = code == VX_SD_PTR || code == VX_SD_PTR_ARRAY;
         EXPECT_EQ(end.has_value(), !structured) << code;
@@ -430,7 +430,7 @@ TEST(SerialCollections, NoneLeaveTheCellAlone) {
 TEST(SerialCollections, ElementTypesMakeAStructure) {
     for (int sd_attr_type : {0, 1}) {
         serial scalar, array;
-        scalar.cx.sd_attr_type = array.cx.sd_attr_type = sd_attr_type;
+        scalar.cx.sd.sd_attr_type = array.cx.sd.sd_attr_type = sd_attr_type;
         dump(scalar, VX_SD_PTR, {VX_INT32, VX_CHAR_PTR});
         EXPECT_EQ(scalar.added(), bytes().u32(2, 0, 2).fill(12).u32(8, 0, 48, 0).fill(8).all);
         dump(array, VX_SD_PTR_ARRAY, {VX_INT32_ARRAY, VX_UINT64_ARRAY});
@@ -442,11 +442,11 @@ TEST(SerialCollections, ElementTypesMakeAStructure) {
 
 TEST(SerialCollections, ThatCannotBeCopiedAreFatal) {
     serial s;
-    s.cx.linenum = 7;
+    s.cx.source.linenum = 7;
     auto end = [&](vx_data_type_t type) { return ending_of([&] { dump(s, type, {VX_UNKNOWN}); }); };
     EXPECT_EQ(end(VX_UNKNOWN), (ending{"dump_dflt: copy_this_type error", 7, 1}));
     EXPECT_EQ(end(VX_SD_PTR), (ending{"dump_dflt: copy_this_sd_type default error", 7, 1}));
-    s.cx.sd_attr_type = 1;
+    s.cx.sd.sd_attr_type = 1;
     EXPECT_EQ(end(VX_SD_PTR_ARRAY), (ending{"dump_dflt: copy_this_sd_type init error", 7, 1}));
 }
 

@@ -1,5 +1,6 @@
 /* Staging tables: growth, appending, looking up; memory and its failures. */
 
+#include "compiler/given_interface.h"
 #include "compiler/util_fixture.h"
 
 #include <cerrno>
@@ -226,7 +227,7 @@ TEST_F(Tables, FiledOnesKeepWhatTheyHold) {
         EXPECT_NE(content, next);
         EXPECT_STREQ(content->tbl_name, "Records");
         EXPECT_EQ(std::string(content->tbl_base, content->used()), std::string(length, 'x'));
-        EXPECT_EQ(cx.filed.size(), length <= 256 ? 0U : length == 257 ? 2U : 4U);
+        EXPECT_EQ(cx.store.filed.size(), length <= 256 ? 0U : length == 257 ? 2U : 4U);
     }
 }
 
@@ -247,7 +248,7 @@ TEST_F(Tables, FiledOnesServeAgain) {
     file_tbl(cx, ref);
     tbl *second = make_tbl(cx, 32, "Second");
     EXPECT_EQ(second, first);
-    EXPECT_EQ(cx.tables.size(), 1U);
+    EXPECT_EQ(cx.store.tables.size(), 1U);
     EXPECT_STREQ(second->tbl_name, "Second");
     EXPECT_EQ(second->tbl_au, 32U);
     EXPECT_EQ(second->tbl_size + second->tbl_capacity, 0U);
@@ -268,7 +269,7 @@ class Traces : public Tables {
 protected:
     void expect(int level, std::initializer_list<size_t> requests, const std::string &out, const std::string &err) {
         tbl t(32, "Records");
-        cx.debugLevel = level;
+        cx.options.debugLevel = level;
         testing::internal::CaptureStdout();
         testing::internal::CaptureStderr();
         for (size_t request : requests)
@@ -291,7 +292,7 @@ TEST_F(Traces, ShowReservationsAndGrowthFromLevel3) {
 TEST_F(Traces, ShowSizesAsInts) {
     tbl t(32, "Records");
     reserve(t, 8);
-    cx.debugLevel = 3;
+    cx.options.debugLevel = 3;
     testing::internal::CaptureStdout();
     testing::internal::CaptureStderr();
     ending_of([&] { reserve(t, ABSURD); });
@@ -315,19 +316,19 @@ TEST_F(Tables, MemoryOfAContextComesZeroed) {
 }
 
 TEST_F(Tables, MemoryThatIsNotToBeHadIsFatal) {
-    cx.linenum = 7;
+    cx.source.linenum = 7;
     EXPECT_EQ(ending_of([&] { cfg_malloc(ABSURD); }), out_of_memory("cfg_malloc malloc failure: "));
 }
 
 TEST_F(Tables, FirstBlockThatIsNotToBeHadIsFatal) {
-    cx.linenum = 7;
+    cx.source.linenum = 7;
     tbl t(ABSURD, "Records");
     EXPECT_EQ(ending_of([&] { reserve(t, 8); }), out_of_memory("Records: alloc_tble malloc failure: "));
     EXPECT_EQ(t.tbl_base, nullptr);
 }
 
 TEST_F(Tables, GrowthThatIsNotToBeHadIsFatalAndLeavesTheBlock) {
-    cx.linenum = 7;
+    cx.source.linenum = 7;
     tbl t(32, "Records");
     add_to_tbl(cx, &t, "kept", 5);
     const char *block = t.tbl_base;
@@ -423,7 +424,7 @@ const lookup lookups[] = {
 const ending outside_the_table = {"Strings: reference outside the table - internal error", 0, 1};
 
 TEST_F(Tables, OnlyTheUsedPartCanBeReferredTo) {
-    cx.linenum = 7;
+    cx.source.linenum = 7;
     tbl t(32, "Strings");
     reserve(t, 24);
     for (const lookup &row : lookups) {
@@ -494,16 +495,16 @@ TEST_F(Tables, StayWhereTheyAreMade) {
     reserve(*first, 8);
     for (int i = 0; i < 1000; ++i)
         make_tbl(cx, 32, "Other");
-    EXPECT_EQ(&cx.tables.front(), first);
+    EXPECT_EQ(&cx.store.tables.front(), first);
     EXPECT_EQ(unit_of(*first), (unit{"First", 64}));
     EXPECT_EQ(first->used(), 8U);
 }
 
 TEST_F(Tables, TablesOfTheContextHaveTheirUnits) {
-    EXPECT_EQ(unit_of(cx.rsrc_cmmap_tbl), (unit{"ResourceCMMaps", 480}));
-    EXPECT_EQ(unit_of(cx.rsrc_mgr_tbl), (unit{"ResourceManagers", 192}));
-    EXPECT_EQ(unit_of(cx.rsrc_var_class_tbl), (unit{"ResourceVariableClasses", 320}));
-    EXPECT_EQ(unit_of(cx.rsrc_class_tbl), (unit{"ResourceClasses", 3584}));
+    EXPECT_EQ(unit_of(cx.sections.rsrc_cmmap_tbl), (unit{"ResourceCMMaps", 480}));
+    EXPECT_EQ(unit_of(cx.sections.rsrc_mgr_tbl), (unit{"ResourceManagers", 192}));
+    EXPECT_EQ(unit_of(cx.sections.rsrc_var_class_tbl), (unit{"ResourceVariableClasses", 320}));
+    EXPECT_EQ(unit_of(cx.sections.rsrc_class_tbl), (unit{"ResourceClasses", 3584}));
     EXPECT_EQ(unit_of(dflt_values("DefaultValues").cells), (unit{"DefaultValues", 32}));
 }
 
@@ -513,7 +514,7 @@ TEST_F(Tables, TablesOfTheStanzasHaveTheirUnits) {
     init_mgr_tbl(cx);
     init_var_class_tbl(cx);
     std::vector<unit> units;
-    for (const tbl &t : cx.tables)
+    for (const tbl &t : cx.store.tables)
         units.push_back(unit_of(t));
     EXPECT_EQ(units, (std::vector<unit>{{"ClassPattrsC", 1152},
                                         {"ClassDattrsC", 2176},
@@ -537,13 +538,14 @@ TEST_F(Tables, VariableIdsHaveTheirUnit) {
     init_class_tbl(cx);
     init_var_class_tbl(cx);
     rsrc_dattr_t attr = {};
-    attr.u_ra_vclass.offset[0] = add_to_tbl(cx, staged_tbl(cx.cb_rsrc_class.u_rc_strings), "Volume", 7);
-    memcpy(alloc_tble(cx, staged_tbl(cx.cb_rsrc_class.u_rc_dattrs), sizeof attr), &attr, sizeof attr);
-    add_to_tbl(cx, staged_tbl(cx.cb_rsrc_variable_class.u_rvc_string_tbl), "Volume", 7);
-    memcpy(alloc_tble(cx, &cx.rsrc_class_tbl, sizeof cx.cb_rsrc_class), &cx.cb_rsrc_class, sizeof cx.cb_rsrc_class);
+    attr.u_ra_vclass.offset[0] = add_to_tbl(cx, staged_tbl(cx.staged.cb_rsrc_class.u_rc_strings), "Volume", 7);
+    memcpy(alloc_tble(cx, staged_tbl(cx.staged.cb_rsrc_class.u_rc_dattrs), sizeof attr), &attr, sizeof attr);
+    add_to_tbl(cx, staged_tbl(cx.staged.cb_rsrc_variable_class.u_rvc_string_tbl), "Volume", 7);
+    memcpy(alloc_tble(cx, &cx.sections.rsrc_class_tbl, sizeof cx.staged.cb_rsrc_class), &cx.staged.cb_rsrc_class,
+           sizeof cx.staged.cb_rsrc_class);
     cmplt_var_class_tbl(cx);
     bld_var_id_tbls(cx);
-    EXPECT_EQ(unit_of(cx.tables.back()), (unit{"VariableIDs", 64}));
+    EXPECT_EQ(unit_of(cx.store.tables.back()), (unit{"VariableIDs", 64}));
 }
 
 } // namespace

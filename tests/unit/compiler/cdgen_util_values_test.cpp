@@ -444,7 +444,7 @@ TEST(Properties, AddTheirBits) {
 
 TEST(Properties, UnknownOnesAreFatal) {
     cdgen cx;
-    cx.linenum = 7;
+    cx.source.linenum = 7;
     auto end = [&](std::string list) {
         vx_uint32_t bits = 0;
         return ending_of([&] { set_props(&bits, props, 3, list.data()); });

@@ -4,6 +4,7 @@
 
 #include "compiler/cdgen.h"
 #include "compiler/cdgen_stanzas.h"
+#include "compiler/given_interface.h"
 
 #include <gtest/gtest.h>
 
@@ -123,8 +124,8 @@ public:
         directory = std::filesystem::temp_directory_path() / name;
         source = directory / "source";
         output = directory / "Out.cdef";
-        cx.cdefsrc = source.c_str();
-        cx.cdefname = output.c_str();
+        cx.options.cdefsrc = source.c_str();
+        cx.options.cdefname = output.c_str();
     }
     compilation(const compilation &) = delete;
     compilation &operator=(const compilation &) = delete;
@@ -161,12 +162,12 @@ public:
 
     /* While the class is open. */
     tbl *table(cdb_ref_t rsrc_class_t::*field) const {
-        return staged_tbl(cx.cb_rsrc_class.*field);
+        return staged_tbl(cx.staged.cb_rsrc_class.*field);
     }
 
     /* What is in a table of the class, be it open or closed. */
     tbl_content *content(cdb_ref_t rsrc_class_t::*field) const {
-        return staged_content(cx.cb_rsrc_class.*field);
+        return staged_content(cx.staged.cb_rsrc_class.*field);
     }
 
     template <class Record> std::span<Record> filed(cdb_ref_t rsrc_class_t::*field) const {
@@ -236,11 +237,11 @@ public:
         for (auto init : {init_cmmap_tbl, init_var_class_tbl, init_pattr_tbl, init_pattrC_tbl, init_dattr_tbl,
                           init_dattrC_tbl, init_action_tbl, init_actionC_tbl, init_sd_tbl})
             init(cx);
-        cx.linenum = LINE;
+        cx.source.linenum = LINE;
     }
 
     stanza_state &state(stanza_id kind) {
-        return cx.stanzas[kind];
+        return cx.framing.stanzas[kind];
     }
 
     /* Optional attributes may stand at once. */

@@ -1,0 +1,53 @@
+/* cdgen_context.h: all state of one compilation. */
+#ifndef CDGEN_CDGEN_CONTEXT_H
+#define CDGEN_CDGEN_CONTEXT_H
+
+#include "compiler/cdgen_error.h"
+#include "compiler/cdgen_framing.h"
+#include "compiler/cdgen_image.h"
+#include "compiler/cdgen_observer.h"
+#include "compiler/cdgen_sd_run.h"
+#include "compiler/cdgen_source.h"
+#include "compiler/cdgen_staging.h"
+#include "compiler/cdgen_variable_ids.h"
+
+#include <cstdio>
+
+/* What the driver wants. */
+struct compile_options {
+    int interactive = 1; /* messages end with a newline */
+    int debugLevel = 0;
+    int swap_endianness = 0;
+    const char *cdefsrc = nullptr;
+    const char *cdefname = nullptr;
+    line_observer *observer = nullptr;
+    FILE *explanations = stdout; /* where the traces go that explain an error; null: nowhere */
+};
+
+struct cdgen {
+    cdgen() = default;
+    cdgen(const cdgen &) = delete;
+    cdgen &operator=(const cdgen &) = delete;
+    ~cdgen();
+
+    compile_options options;
+    source_reader source;
+    stanza_framing framing;
+    staging_records staged;
+    section_tables sections;
+    table_store store;
+    names_for_later later;
+    valid_value_lists valid_values;
+    range_state range;
+    sd_run sd;
+    text_pool line_texts; /* out-of-line values of the current line */
+    /* errno as the number conversions see it. Nothing clears it: after an overflow, every later 0 or limit value is
+     * refused. Existing sources rely on this. */
+    int conv_errno = 0;
+    variable_id_lists variable_ids;
+    stray_references stray;
+    image_cursor image;
+    output_file output;
+};
+
+#endif

@@ -1,0 +1,50 @@
+/* cdgen_framing.h: which stanza is open, and what is known of each kind's latest one. */
+#ifndef CDGEN_CDGEN_FRAMING_H
+#define CDGEN_CDGEN_FRAMING_H
+
+#include "compiler/cdgen_tables.h"
+#include "language/catalogue.h"
+
+#include <array>
+#include <memory>
+
+/* Values that wait for their attribute to be completed: one 8-byte cell each, for an SD-typed attribute the types of
+ * its elements. */
+struct dflt_values {
+    dflt_values(const char *name) : cells(32, name) {}
+
+    /* Empty, as if it were new, but for memory that serves again. */
+    void restart(const char *name) {
+        cells.restart(name);
+        texts.clear();
+    }
+
+    struct tbl cells;
+    text_pool texts; /* what the cells point at */
+};
+
+/* The list is shared by an SD-typed attribute's stanza and the SD stanzas that follow it. */
+struct dflt_tbl {
+    std::shared_ptr<dflt_values> tbl;
+    size_t num_elems = 0;
+};
+
+/* What is known of a kind's current stanza. */
+struct stanza_state {
+    vx_uint32_t req_mask = 0; /* required attributes seen */
+    vx_uint32_t opt_mask = 0; /* optional attributes seen, with their OPTIONAL bit */
+    dflt_tbl dflt;
+};
+
+/* The current stanza. */
+struct stanza_framing {
+    int table_id = -1; /* its stanza_id; -1 before the first header */
+    const srtable_ctrl *scp = nullptr;
+    const srtable_ctrl *prev_scp = nullptr;
+    const srtable_ctrl *curr_sd_scp = nullptr; /* of the latest header */
+    stanza_state *state = nullptr;             /* that of scp */
+    std::array<stanza_state, SC_COUNT> stanzas;
+    std::shared_ptr<dflt_values> spare_dflt; /* one that no stanza holds any more, for the next */
+};
+
+#endif

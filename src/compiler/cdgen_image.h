@@ -1,0 +1,55 @@
+/* cdgen_image.h: the image: its sizes, its sections and the output file. */
+#ifndef CDGEN_CDGEN_IMAGE_H
+#define CDGEN_CDGEN_IMAGE_H
+
+#include "cdb.h"
+
+#include <cstddef>
+#include <span>
+#include <vector>
+
+struct cdgen;
+
+/* A word of an attribute's record that looks like a reference and is none. */
+struct stray_reference {
+    int rsrc_class; /* the class's position among all */
+    cdb_ref_t rsrc_class_t::*records;
+    size_t offset; /* in that table of the class, bytes */
+};
+
+/* What the reversal cannot see in the image. */
+struct stray_references {
+    std::vector<stray_reference> strays; /* by class */
+    size_t strays_done = 0;              /* those whose class has been written */
+    std::vector<size_t> nowhere;         /* their places in the image, in bytes */
+};
+
+/* The output file once it is mapped. */
+struct output_file {
+    int cdb_mapfile_fd = 0;
+    void *cdb_mapfile_ptr = nullptr;
+    size_t gross_file_size = 0; /* bytes pre-filled and mapped */
+};
+
+/* The image is reached by copying: sections are not aligned. */
+struct image_cursor {
+    char *chp = nullptr;         /* the image: its header */
+    char *dsect_anchs = nullptr; /* the anchors */
+    int dsect_count = 0;
+    int dsect_idx = 0;   /* the anchor being filled */
+    char *dsp = nullptr; /* where the next bytes go */
+};
+
+/* The image. cdb_size also stores counts and sizes into the staged class records; fit_image counts the sections first,
+ * and so finds all that can be wrong with an image before there is a file. */
+void bld_cdb(cdgen &cx);
+size_t fit_image(cdgen &cx);
+size_t cdb_size(cdgen &cx);
+void add_rsrc_class_tbls(cdgen &cx);
+void add_rsrc_mgr_tbls(cdgen &cx);
+void add_rsrc_cmmap_tbls(cdgen &cx);
+void add_rsrc_var_class_tbls(cdgen &cx);
+/* Unmaps, closes and removes the output file if it is mapped. */
+void discard_mapfile(cdgen &cx);
+
+#endif

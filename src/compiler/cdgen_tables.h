@@ -1,0 +1,153 @@
+/* cdgen_tables.h: staging tables and the memory of a compilation. */
+#ifndef CDGEN_CDGEN_TABLES_H
+#define CDGEN_CDGEN_TABLES_H
+
+#include "cdb.h"
+
+#include <cstddef>
+#include <cstdint>
+#include <cstdlib>
+#include <cstring>
+#include <deque>
+#include <optional>
+#include <span>
+#include <vector>
+
+struct cdgen;
+
+/* What a table holds: all that stays of one to which nothing more is to come. */
+struct tbl_content {
+    size_t used() const {
+        return static_cast<size_t>(tbl_next - tbl_base);
+    }
+
+    char *tbl_base = nullptr;       /* null until the first reservation */
+    char *tbl_next = nullptr;       /* first unreserved byte */
+    const char *tbl_name = nullptr; /* for traces and messages */
+};
+
+/* An append-only arena of zero-filled bytes. Grows by whole allocation units, and so does tbl_size, which the traces
+ * show; underneath, memory is taken in larger steps. The block moves when it grows: whatever refers into a table does
+ * so by its offset from tbl_base. Once there is a block, tbl_next < tbl_end and all bytes between them are 0. */
+struct tbl : tbl_content {
+    tbl(size_t au, const char *name) : tbl_content{nullptr, nullptr, name}, tbl_au(au) {}
+    tbl(const tbl &) = delete;
+    tbl &operator=(const tbl &) = delete;
+    ~tbl();
+
+    /* Empty, as if it were new; the block waits for the first reservation. */
+    void restart(const char *name);
+
+    size_t room() const {
+        return static_cast<size_t>(tbl_end - tbl_next);
+    }
+
+    char *tbl_prev_base = nullptr; /* the block before its latest move; for diagnosis */
+    size_t tbl_size = 0;           /* bytes, a multiple of tbl_au */
+    char *tbl_end = nullptr;       /* tbl_base + tbl_size */
+    size_t tbl_au;                 /* bytes: the first block and the granule of every growth */
+    size_t tbl_capacity = 0;       /* bytes really held, at least tbl_size */
+    char *tbl_spare = nullptr;     /* the block before the first reservation, if there is one already */
+};
+
+/* Where the container that is being filled stands in a string table; nothing until the first element is added. */
+using tbl_anchor = std::optional<vx_uint32_t>;
+
+constexpr size_t round8(size_t n) {
+    return (n + 7) & ~size_t{7};
+}
+
+/* Zero-filled memory, to be given back with free(). Failing is fatal, with errno as the status. */
+void *cfg_malloc(size_t s);
+
+/* A new, empty table that stays until it is filed, or as long as the context. */
+tbl *make_tbl(cdgen &cx, size_t au, const char *name);
+
+/* Reserves s bytes, zeroed, at the end of t. The address holds until the next reservation in t. */
+void *alloc_tble(cdgen &cx, tbl *t, size_t s);
+
+/* Gives back what a table does not use, down to tbl_next. */
+void trim_tbl(tbl *t);
+
+/* Keeps of the table that a staged record refers to only what it holds, once nothing more is to come, and lets the
+ * record refer to that; to nothing, if it is empty. With many classes the rest would be most of the memory. The table
+ * itself serves again. */
+void file_tbl(cdgen &cx, cdb_ref_t &ref);
+
+/* Appends len bytes, zero-filled up to a multiple of 8; returns their offset from tbl_base. add_to_tbl is the name that
+ * serves for strings and serialised values. */
+vx_uint32_t save_tbl_val_round(cdgen &cx, tbl *tp, const void *val, size_t len);
+vx_uint32_t add_to_tbl(cdgen &cx, tbl *tp, const void *data, size_t len);
+
+/* The record at an offset of a staging table, valid until the next reservation in it. An offset that leads out of the
+ * used part is a defect of the program and fatal. Offsets of records are multiples of their alignment. */
+void *tbl_at(tbl_content *t, size_t offset, size_t size);
+
+template <class Record> Record *record_at(tbl_content *t, size_t offset) {
+    return static_cast<Record *>(tbl_at(t, offset, sizeof(Record)));
+}
+
+/* All records of a table that holds nothing else. */
+template <class Record> std::span<Record> records_of(tbl_content *t) {
+    if (t == nullptr || t->tbl_base == nullptr)
+        return {};
+    return {reinterpret_cast<Record *>(t->tbl_base), t->used() / sizeof(Record)};
+}
+
+/* While a record is staged, the reference to a table of its own holds the address of what is in the table, which may
+ * have been filed. */
+inline tbl_content *staged_content(const cdb_ref_t &ref) {
+    tbl_content *t = nullptr;
+    std::memcpy(&t, ref.pointer, sizeof t);
+    return t;
+}
+
+/* The table itself, while the record is open. */
+inline tbl *staged_tbl(const cdb_ref_t &ref) {
+    return static_cast<tbl *>(staged_content(ref));
+}
+
+inline void stage_tbl(cdb_ref_t &ref, tbl_content *t) {
+    ref = {};
+    std::memcpy(ref.pointer, &t, sizeof t);
+}
+
+/* Values of a class that stand out of line while they wait to be serialised: texts and binaries. */
+class text_pool {
+public:
+    text_pool() = default;
+    text_pool(const text_pool &) = delete;
+    text_pool &operator=(const text_pool &) = delete;
+    ~text_pool();
+
+    /* n zeroed bytes, aligned for any value, that stay until the pool is emptied. Null if there is no memory. */
+    char *take(size_t n);
+    /* Gives everything back but for the room of the latest chunk. */
+    void clear();
+
+private:
+    struct chunk;
+    chunk *head = nullptr;
+    size_t left = 0; /* bytes of head not yet taken */
+};
+
+struct free_memory {
+    void operator()(void *p) const {
+        free(p);
+    }
+};
+
+/* The tables that records of a compilation own, and what is left of those to which nothing more is to come. */
+struct table_store {
+    table_store() = default;
+    table_store(const table_store &) = delete;
+    table_store &operator=(const table_store &) = delete;
+    ~table_store();
+
+    std::deque<tbl> tables;          /* the records that own them refer to them */
+    std::vector<tbl *> spare_tables; /* those of them that have been filed */
+    std::deque<tbl_content> filed;   /* contents of filed tables: blocks of their own, */
+    text_pool filed_small;           /* or a few bytes, and what refers to them */
+};
+
+#endif

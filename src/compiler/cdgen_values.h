@@ -1,0 +1,76 @@
+/* cdgen_values.h: data types by name, texts to values, values to cells and string tables. */
+#ifndef CDGEN_CDGEN_VALUES_H
+#define CDGEN_CDGEN_VALUES_H
+
+#include "compiler/cdgen_tables.h"
+#include "format/data_types.h"
+#include "format/names.h"
+
+#include <cstddef>
+
+/* What a serialised value stands for. */
+enum type_out_mode {
+    TYPE_SAME = 1, /* the given value */
+    TYPE_16 = 2,   /* the given integer, narrowed to 16 bits */
+    TYPE_INIT = 3,
+    INIT_DEFAULT = 4, /* a dynamic attribute's initial value */
+    DFLT_DEFAULT = 5, /* a persistent attribute's default */
+    R_LO_DEFAULT = 6, /* a range's lower bound */
+    R_HI_DEFAULT = 7  /* a range's upper bound */
+};
+
+/* The code of a type's source name; VX_UNKNOWN for null, unknown names and "UNKNOWN" itself. */
+vx_data_type_t strToVxDt(const char *s);
+/* 0 and the code of a variable type's name, or 1 with *t left alone. */
+int strToVar(const char *s, orb_variable_type_t *t);
+
+/* Integers by the rules of the C library, base 0, 8 or 10. An overflow is remembered in cx.conv_errno. */
+long int_from_text(cdgen &cx, const char *text, char **end, int base);
+
+/* Converts text into *vx_out, for an array type into one element; 0, or -1 if the text is no value of the type. Texts
+ * and binaries stand in the pool. */
+int str_to_vx(cdgen &cx, vx_value_t *vx_out, vx_data_type_t vx_type, const char *str_in, text_pool &pool);
+/* Decode into a block of a 32-bit length and bytes, for which vx_out must have room: 0, or -1 on malformed text.
+ * oct_convert knows two forms of output: 1, text with a NUL at its end; 2, such a block. */
+int hex_convert(char *vx_out, const char *str_in);
+int oct_convert(cdgen &cx, const char *p, int type, char *out_buf);
+/* The text inside a pair of double quotes; s itself when it is not quoted; null when the quotes do not match. Writes a
+ * NUL over the closing quote. */
+char *strip_quotes(char *s);
+/* The same for a text that is known to end, with a NUL, at *end, which becomes the end of what is returned. */
+char *strip_quotes(char *s, char **end);
+/* ORs the bits of the properties named in a comma-separated list, which it takes apart, into *dest. An unknown name is
+ * fatal. */
+void set_props(vx_uint32_t *dest, const props_t *props, int len, char *vnoq);
+/* Packs up to four dotted numbers into *n; always 0. */
+int ver_str_convert(cdgen &cx, const char *ver_str, vx_uint32_t *n);
+/* Ends the text at its first comma and returns what follows; null without a comma. */
+char *getNextArrVal(char *line);
+
+/* Write a value, or with no in_data the default that the mode asks for, into a record's cell and, out of line, into the
+ * string table. Arrays are filled one element a call, with a capacity of array_cnt. 0, or -1 for a type and mode that
+ * do not go together. */
+int copy_this_type(cdgen &cx, vx_value_t *out_data, const vx_value_t *in_data, vx_data_type_t type_in, int type_out,
+                   tbl *str_tbl, tbl_anchor *array_anchor, vx_uint32_t array_cnt);
+
+/* The anchors of one structured value in the making. */
+struct sd_anchors {
+    tbl_anchor array;      /* of the element's own array */
+    tbl_anchor sd_array;   /* of the array of structured data */
+    tbl_anchor sd_element; /* of the structured data */
+};
+
+/* Adds one element of type type_in, with its default, to a structured value of array_cnt elements whose kind sd_type is
+ * VX_SD_PTR or VX_SD_PTR_ARRAY. */
+int copy_this_sd_type(cdgen &cx, vx_value_t *out_data, vx_data_type_t type_in, int type_out, tbl *str_tbl,
+                      sd_anchors *anchors, vx_uint32_t array_cnt, vx_data_type_t sd_type);
+
+/* Make the container if the anchor is empty, storing its offset in *out_data, and count one element more. Return the
+ * offset of that element: of its value cell for an array, of the whole element for structured data (of the structure if
+ * sd_cnt is 0). */
+vx_uint32_t init_array(cdgen &cx, tbl *str_tbl, tbl_anchor *anchor, vx_uint32_t array_cnt, vx_value_t *out_data);
+vx_uint32_t init_scalar_sd(cdgen &cx, tbl *str_tbl, tbl_anchor *anchor, vx_uint32_t sd_cnt, vx_value_t *out_data);
+vx_uint32_t init_array_sd(cdgen &cx, tbl *str_tbl, tbl_anchor *array_anchor, tbl_anchor *sd_anchor,
+                          vx_uint32_t array_cnt, vx_uint32_t sd_cnt, vx_value_t *out_data);
+
+#endif

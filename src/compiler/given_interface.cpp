@@ -1,0 +1,47 @@
+/* given_interface.cpp: functions that are laid down and that nothing in the program calls. */
+
+#include "compiler/given_interface.h"
+
+#include "compiler/cdgen_attr.h"
+#include "compiler/cdgen_values.h"
+
+#include <cstring>
+
+void memcpy_8_rounded(char *dst, const char *src, int len) {
+    int rounded = (len + 7) & ~7;
+    memcpy(dst, src, static_cast<size_t>(len));
+    if (rounded > len)
+        memset(dst + len, 0, static_cast<size_t>(rounded - len));
+}
+
+vx_uint32_t mk_sd_data_tbl(cdgen &cx, vx_data_type_t sd_type, tbl *dflt_tp) {
+    if (scalar_vx(sd_type) != VX_SD_PTR)
+        source_error(cx, MSG_NOT_AN_SD_TYPE);
+    size_t size = sd_type == VX_SD_PTR ? sizeof(vx_structured_data_t) : sizeof(vx_array_t);
+    auto *header = static_cast<char *>(alloc_tble(cx, dflt_tp, size));
+    return static_cast<vx_uint32_t>(header - dflt_tp->tbl_base);
+}
+
+void del_tbl_entry(cdgen &cx, const rsrc_variable_class_t *rvcp) {
+    for (size_t i = 0; i < cx.variable_ids.tbl_entry_used; ++i)
+        if (cx.variable_ids.tbl_entries[i].rvcp == rvcp)
+            cx.variable_ids.tbl_entries[i] = {};
+}
+
+const char *is_SD_stanza(int table_id) {
+    return strstr(sc_tables[static_cast<size_t>(table_id)].sc_name, "SDDefinition");
+}
+
+sd_type_t SD_stanza_type(int table_id) {
+    const sd_owner *owner = sc_tables[static_cast<size_t>(table_id)].sc_sd_owner;
+    return owner == nullptr ? SD_TYPE_UNKNOWN : owner->type;
+}
+
+tbl *sc_sd_tbl(cdgen &cx, const srtable_ctrl &kind) {
+    return kind.sc_side_tables == TABLES_OF_CMMAP ? nullptr : staged_tbl(cx.staged.cb_rsrc_class.u_rc_sd_defs);
+}
+
+void save_attr(cdgen &cx, char *il, int table_id) {
+    char *name = il + strspn(il, " \t");
+    save_attr_line(cx, {il, name, name + strlen(name)}, static_cast<stanza_id>(table_id));
+}

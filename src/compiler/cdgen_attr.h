@@ -15,14 +15,7 @@ struct attr_line {
     size_t length = strlen(value);
 };
 
-/* A line of which is known where its text begins, behind the blanks, and where it ends, with a NUL. */
-struct attr_text {
-    char *line;
-    char *name;
-    char *end;
-};
-
-/* What save_attr does. */
+/* Takes one attribute line of a stanza of that kind. */
 void save_attr_line(cdgen &cx, const attr_text &text, stanza_id kind);
 
 /* Converts the value and stores it, by the attribute's type. */

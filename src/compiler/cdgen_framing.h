@@ -13,7 +13,7 @@
 struct dflt_values {
     dflt_values(const char *name) : cells(32, name) {}
 
-    /* Empty, as if it were new, but for memory that serves again. */
+    /* Empty, as if new, except that memory is reused. */
     void restart(const char *name) {
         cells.restart(name);
         texts.clear();
@@ -44,7 +44,7 @@ struct stanza_framing {
     const srtable_ctrl *curr_sd_scp = nullptr; /* of the latest header */
     stanza_state *state = nullptr;             /* that of scp */
     std::array<stanza_state, SC_COUNT> stanzas;
-    std::shared_ptr<dflt_values> spare_dflt; /* one that no stanza holds any more, for the next */
+    std::shared_ptr<dflt_values> spare_dflt; /* no longer held by any stanza; for reuse */
 };
 
 #endif

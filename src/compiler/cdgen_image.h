@@ -10,7 +10,7 @@
 
 struct cdgen;
 
-/* A word of an attribute's record that looks like a reference and is none. */
+/* A word of an attribute's record that looks like a reference but is not one. */
 struct stray_reference {
     int rsrc_class; /* the class's position among all */
     cdb_ref_t rsrc_class_t::*records;

@@ -1,110 +1,11 @@
-/* cdgen_read.cpp: reads the source line by line, removes comments, and frames stanzas. */
+/* cdgen_read.cpp: the framing of stanzas, and the loop that takes a source line by line. */
 
 #include "compiler/cdgen_read.h"
 
-#include "compiler/above_stdio.h"
 #include "compiler/cdgen.h"
 #include "compiler/cdgen_stanzas.h"
 
-#include <algorithm>
-#include <cerrno>
-#include <fcntl.h>
-#include <limits>
-#include <sys/stat.h>
-#include <unistd.h>
-
 namespace {
-
-/* What may end a line's text before its newline: quotes and comments, and the NUL behind the last byte. They are rare.
- * Where the next one stands is found once, however many lines stand before it. */
-char *next_mark(char *from) {
-    return from + strcspn(from, "\"#/");
-}
-
-/* Copies up to `room` bytes of the source; 0 at its end. */
-size_t read_some(cdgen &cx, char *to, size_t room) {
-    source_file &source = cx.source.cdb_fp;
-    if (source.fd < 0) {
-        size_t copied = source.memory.copy(to, room);
-        source.memory.remove_prefix(copied);
-        return copied;
-    }
-    ssize_t n = 0;
-    do
-        n = read(source.fd, to, room);
-    while (n < 0 && errno == EINTR);
-    if (n < 0) {
-        int error = errno;
-        cdgen_error_exit(MSG_CANNOT_READ, cx.options.cdefsrc, strerror(error), 0, error);
-    }
-    return static_cast<size_t>(n);
-}
-
-/* Moves a line's beginning to the front of the buffer and reads what follows; false at the end of the source. */
-bool refill(cdgen &cx) {
-    source_file &source = cx.source.cdb_fp;
-    size_t begun = source.end - source.pos;
-    memmove(source.buffer.data(), source.buffer.data() + source.pos, begun);
-    size_t n = read_some(cx, source.buffer.data() + begun, SOURCE_BUFFER - begun);
-    source.pos = 0;
-    source.end = begun + n;
-    source.buffer[source.end] = '\0';
-    source.mark = next_mark(source.buffer.data());
-    return n > 0;
-}
-
-source_line whole_line(source_file &source, char *begin, char *newline) {
-    source.pos += static_cast<size_t>(newline - begin) + 1;
-    if (source.mark < begin)
-        source.mark = next_mark(begin);
-    return {begin, newline, source.mark};
-}
-
-source_line cut_line(cdgen &cx, const char *begin, size_t length) {
-    cx.source.cdb_fp.pos += length;
-    memcpy(cx.source.inbuf, begin, length);
-    cx.source.inbuf[length] = '\0';
-    cx.source.cdb_fp.cut_mark = next_mark(cx.source.inbuf);
-    return {cx.source.inbuf, cx.source.inbuf + length, cx.source.cdb_fp.cut_mark};
-}
-
-source_line some_line(cdgen &cx) {
-    source_file &source = cx.source.cdb_fp;
-    for (;;) {
-        char *begin = source.buffer.data() + source.pos;
-        size_t there = std::min(LINE_MAX_CHARS, source.end - source.pos);
-        if (void *newline = memchr(begin, '\n', there))
-            return whole_line(source, begin, static_cast<char *>(newline));
-        if (there == LINE_MAX_CHARS || (!refill(cx) && there > 0))
-            return cut_line(cx, source.buffer.data() + source.pos, there);
-        if (source.end == 0)
-            return {nullptr, nullptr, source.mark};
-    }
-}
-
-bool is_blank(char c) {
-    return c == ' ' || c == '\t';
-}
-
-/* Where the text of a line that has marks ends: at its newline, its comment, or its NUL. Null for a line without text:
- * blanks, quotes and comments are none. */
-char *end_by_marks(const source_line &line, char *p) {
-    bool text_seen = false;
-    bool quoted = false;
-    for (;; p = line.mark + 1, line.mark = next_mark(p)) {
-        char *mark = line.mark;
-        while (!text_seen && is_blank(*p))
-            ++p;
-        text_seen = text_seen || p < std::min(mark, line.end);
-        if (mark >= line.end)
-            return text_seen ? line.end : nullptr;
-        bool comment = *mark == '#' || (*mark == '/' && (mark[1] == '/' || mark[1] == '*'));
-        if (*mark == '\0' || (comment && !quoted) || (*mark == '#' && !text_seen))
-            return text_seen ? mark : nullptr;
-        quoted = quoted != (*mark == '"');
-        text_seen = text_seen || (*mark == '/' && !comment);
-    }
-}
 
 bool class_is_open(const cdgen &cx) {
     return cx.staged.cb_rsrc_class.rc_cb_ID != 0;
@@ -196,53 +97,6 @@ void begin_stanza(cdgen &cx, const char *name) {
 }
 
 } // namespace
-
-void source_file::close() {
-    if (fd >= 0)
-        ::close(fd);
-    fd = -1;
-}
-
-void open_source(cdgen &cx, const char *filename) {
-    take_source(cx, filename, above_stdio(open(filename, O_RDONLY | O_CLOEXEC)));
-}
-
-void take_source(cdgen &cx, const char *filename, int fd) {
-    source_file &source = cx.source.cdb_fp;
-    source.fd = fd;
-    struct stat st = {};
-    if (source.fd < 0 || fstat(source.fd, &st) != 0)
-        cdgen_error_exit(MSG_CANNOT_OPEN, filename, strerror(errno), 0, errno);
-    source.device = st.st_dev;
-    source.inode = st.st_ino;
-    cx.framing.table_id = -1;
-}
-
-void take_source(cdgen &cx, std::string_view bytes) {
-    cx.source.cdb_fp.close();
-    cx.source.cdb_fp.memory = bytes;
-    cx.framing.table_id = -1;
-}
-
-source_line next_line(cdgen &cx) {
-    source_line line = some_line(cx);
-    if (line.begin != nullptr && cx.source.linenum < std::numeric_limits<int>::max())
-        ++cx.source.linenum;
-    return line;
-}
-
-attr_text text_of(const source_line &line) {
-    char *begin = line.begin;
-    while (is_blank(*begin))
-        ++begin;
-    char *end = line.mark < line.end ? end_by_marks(line, begin) : begin < line.end ? line.end : nullptr;
-    if (end == nullptr)
-        return {line.begin, begin, nullptr};
-    while (is_blank(end[-1]) || end[-1] == '#') /* there is text in front */
-        --end;
-    *end = '\0';
-    return {line.begin, begin, end};
-}
 
 void take_line(cdgen &cx, const attr_text &text) {
     if (text.name == text.line)

@@ -1,4 +1,4 @@
-/* cdgen_source.h: the source while it is read. */
+/* cdgen_source.h: the source file, its lines and their texts. */
 #ifndef CDGEN_CDGEN_SOURCE_H
 #define CDGEN_CDGEN_SOURCE_H
 
@@ -8,6 +8,8 @@
 #include <cstddef>
 #include <string_view>
 #include <sys/types.h>
+
+struct cdgen;
 
 constexpr size_t SOURCE_BUFFER = 65536; /* bytes asked for by one read */
 
@@ -39,5 +41,35 @@ struct source_reader {
     int linenum = 0;                     /* reads made; a line of more than LINE_MAX_CHARS takes several */
     int linepos = 0;                     /* column, from 1 */
 };
+
+/* A line's text, which ends with a NUL. */
+struct attr_text {
+    char *line; /* where the line begins */
+    char *name; /* the first character that is not a blank */
+    char *end;
+};
+
+/* A line in the read buffer; its end is the place of its newline. A line without a newline is copied to inbuf. */
+struct source_line {
+    char *begin; /* null: the source has no more lines */
+    char *end;
+    char *&mark; /* the first mark from begin on; at or after end if the line has none */
+};
+
+/* Fatal if the source cannot be opened or, later, read. */
+void open_source(cdgen &cx, const char *filename);
+
+/* The same for a descriptor that is open, or -1 with errno; it is the context's from now on. */
+void take_source(cdgen &cx, const char *filename, int fd);
+
+/* The same for a source in memory, which must stay until it has been read. */
+void take_source(cdgen &cx, std::string_view bytes);
+
+/* The next line, or the next 254 characters of a longer one, and counts it. It stays until the next call. */
+source_line next_line(cdgen &cx);
+
+/* A line's text: the line without its comment, and without trailing blanks and hash signs, even quoted ones. Its end is
+ * null for a line without text. */
+attr_text text_of(const source_line &line);
 
 #endif

@@ -15,7 +15,7 @@
 
 struct cdgen;
 
-/* What a table holds: all that stays of one to which nothing more is to come. */
+/* The bytes of a table; all that is kept of a table once it is finished. */
 struct tbl_content {
     size_t used() const {
         return static_cast<size_t>(tbl_next - tbl_base);
@@ -26,9 +26,9 @@ struct tbl_content {
     const char *tbl_name = nullptr; /* for traces and messages */
 };
 
-/* An append-only arena of zero-filled bytes. Grows by whole allocation units, and so does tbl_size, which the traces
- * show; underneath, memory is taken in larger steps. The block moves when it grows: whatever refers into a table does
- * so by its offset from tbl_base. Once there is a block, tbl_next < tbl_end and all bytes between them are 0. */
+/* An append-only arena of zero-filled bytes. It grows by whole allocation units, and so does tbl_size, which the traces
+ * show; memory is allocated in larger steps. The block moves when it grows, so references into a table are offsets from
+ * tbl_base. Once there is a block, tbl_next < tbl_end and all bytes between them are 0. */
 struct tbl : tbl_content {
     tbl(size_t au, const char *name) : tbl_content{nullptr, nullptr, name}, tbl_au(au) {}
     tbl(const tbl &) = delete;
@@ -50,7 +50,7 @@ struct tbl : tbl_content {
     char *tbl_spare = nullptr;     /* the block before the first reservation, if there is one already */
 };
 
-/* Where the container that is being filled stands in a string table; nothing until the first element is added. */
+/* The offset in a string table of the container that is being filled; nothing until the first element is added. */
 using tbl_anchor = std::optional<vx_uint32_t>;
 
 constexpr size_t round8(size_t n) {
@@ -69,9 +69,8 @@ void *alloc_tble(cdgen &cx, tbl *t, size_t s);
 /* Gives back what a table does not use, down to tbl_next. */
 void trim_tbl(tbl *t);
 
-/* Keeps of the table that a staged record refers to only what it holds, once nothing more is to come, and lets the
- * record refer to that; to nothing, if it is empty. With many classes the rest would be most of the memory. The table
- * itself serves again. */
+/* Moves a finished table's bytes to compact storage and points the record at them, or at nothing if there are none.
+ * With many classes, the unused rest would be most of the memory. The table itself is reused. */
 void file_tbl(cdgen &cx, cdb_ref_t &ref);
 
 /* Appends len bytes, zero-filled up to a multiple of 8; returns their offset from tbl_base. add_to_tbl is the name that
@@ -79,8 +78,8 @@ void file_tbl(cdgen &cx, cdb_ref_t &ref);
 vx_uint32_t save_tbl_val_round(cdgen &cx, tbl *tp, const void *val, size_t len);
 vx_uint32_t add_to_tbl(cdgen &cx, tbl *tp, const void *data, size_t len);
 
-/* The record at an offset of a staging table, valid until the next reservation in it. An offset that leads out of the
- * used part is a defect of the program and fatal. Offsets of records are multiples of their alignment. */
+/* The record at an offset of a staging table, valid until the next reservation in it. An offset outside the used part
+ * is a defect of the program and fatal. Offsets of records are multiples of their alignment. */
 void *tbl_at(tbl_content *t, size_t offset, size_t size);
 
 template <class Record> Record *record_at(tbl_content *t, size_t offset) {
@@ -94,7 +93,7 @@ template <class Record> std::span<Record> records_of(tbl_content *t) {
     return {reinterpret_cast<Record *>(t->tbl_base), t->used() / sizeof(Record)};
 }
 
-/* While a record is staged, the reference to a table of its own holds the address of what is in the table, which may
+/* While a record is staged, the reference to one of its side tables holds the address of the table's content, which may
  * have been filed. */
 inline tbl_content *staged_content(const cdb_ref_t &ref) {
     tbl_content *t = nullptr;
@@ -112,7 +111,7 @@ inline void stage_tbl(cdb_ref_t &ref, tbl_content *t) {
     std::memcpy(ref.pointer, &t, sizeof t);
 }
 
-/* Values of a class that stand out of line while they wait to be serialised: texts and binaries. */
+/* Out-of-line values, texts and binaries, until they are serialised. */
 class text_pool {
 public:
     text_pool() = default;
@@ -122,7 +121,7 @@ public:
 
     /* n zeroed bytes, aligned for any value, that stay until the pool is emptied. Null if there is no memory. */
     char *take(size_t n);
-    /* Gives everything back but for the room of the latest chunk. */
+    /* Frees everything except the latest chunk, which is reused. */
     void clear();
 
 private:
@@ -137,7 +136,7 @@ struct free_memory {
     }
 };
 
-/* The tables that records of a compilation own, and what is left of those to which nothing more is to come. */
+/* The side tables of a compilation's records, and the contents of finished ones. */
 struct table_store {
     table_store() = default;
     table_store(const table_store &) = delete;
@@ -145,9 +144,9 @@ struct table_store {
     ~table_store();
 
     std::deque<tbl> tables;          /* the records that own them refer to them */
-    std::vector<tbl *> spare_tables; /* those of them that have been filed */
-    std::deque<tbl_content> filed;   /* contents of filed tables: blocks of their own, */
-    text_pool filed_small;           /* or a few bytes, and what refers to them */
+    std::vector<tbl *> spare_tables; /* tables that have been filed, for reuse */
+    std::deque<tbl_content> filed;   /* contents of filed tables that have a block of their own */
+    text_pool filed_small;           /* small contents, each after its tbl_content */
 };
 
 #endif

@@ -2,9 +2,12 @@
 
 #include "language/messages.h"
 
+#include "language/limits.h"
+
 #include <algorithm>
 #include <cstddef>
 #include <iterator>
+#include <limits>
 
 namespace {
 
@@ -220,6 +223,20 @@ consteval bool rows_are_sound() {
     return true;
 }
 static_assert(rows_are_sound(), "in the order of the ids and of the codes, with code, text, cause and cure");
+
+/* Whether a text states the number. */
+consteval bool states(std::string_view text, std::size_t number) {
+    char digits[20] = {};
+    std::size_t first = std::size(digits);
+    for (; number > 0; number /= 10)
+        digits[--first] = static_cast<char>('0' + number % 10);
+    return text.find(std::string_view(digits + first, std::size(digits) - first)) != std::string_view::npos;
+}
+static_assert(states(table[MSG_TOO_MANY_VARIABLE_CLASSES].text, VARIABLE_CLASSES_MAX));
+static_assert(states(table[MSG_TOO_MANY_VARIABLE_CLASSES].cause, VARIABLE_CLASSES_MAX));
+static_assert(states(table[MSG_VALUE_TOO_LONG].cause, VALUE_MAX_CHARS));
+static_assert(states(table[MSG_TOO_MANY_RECORDS].text, std::numeric_limits<std::uint16_t>::max()));
+static_assert(states(table[MSG_TABLE_TOO_LARGE].text, std::numeric_limits<std::uint32_t>::max()));
 
 } // namespace
 

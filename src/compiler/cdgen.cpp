@@ -21,7 +21,8 @@ void parse_options(cdgen &cx, int argc, char **argv) {
             cx.options.interactive = 0;
             break;
         case 'd':
-            cx.options.debugLevel = atoi(optarg); /* text that is no number is 0; not a conversion of the source's */
+            cx.options.debugLevel =
+                atoi(optarg); /* 0 for text that is not a number; not a conversion of the source's */
             break;
         case 's':
             cx.options.swap_endianness = 1;
@@ -80,7 +81,7 @@ int cdgen_main(int argc, char **argv) {
         return 0;
     } catch (const fatal_exit &failure) {
         return report(cx, failure);
-    } catch (const std::bad_alloc &) { /* of the standard library's containers */
+    } catch (const std::bad_alloc &) { /* thrown by the standard library's containers */
         return report(cx, {MSG_OUT_OF_MEMORY, strerror(ENOMEM), nullptr, 0, ENOMEM});
     }
 }

@@ -51,7 +51,7 @@ bool missing_excused(const cdgen &cx, const srtable_ctrl &scp) {
            cx.options.observer->excuses_missing(static_cast<int>(&scp - sc_tables.data()));
 }
 
-/* Optional attributes follow the required ones; most may stand once. */
+/* Optional attributes follow the required ones; most may be given only once. */
 void count_optional(cdgen &cx, const srtable_ctrl &scp, stanza_state &state, const table_attrs &attr) {
     if (state.req_mask != scp.req_mask_cmplt && !missing_excused(cx, scp))
         source_error(cx, MSG_OPTIONAL_TOO_EARLY, attr.ta_name);

@@ -87,7 +87,7 @@ void store_perm_template(const attr_line &line) {
     store(field_of(line), vx_uint32_t{0xEEEEEEEE});
 }
 
-/* Only the first letter counts; one that is no permission leaves the field as it is. */
+/* Only the first letter counts; an unknown letter leaves the field as it is. */
 void store_permission(const attr_line &line) {
     for (const valid_perms_t *perm = perm_list; perm < perm_list + num_perm_list; ++perm)
         if (perm->permission == line.value[0]) {
@@ -271,7 +271,7 @@ bool takes_range(vx_data_type_t type) {
     return scalar < VX_CHAR_PTR || scalar > VX_SD_PTR;
 }
 
-/* Deliberate: an open resource attribute gets the range even when the line stands in a class attribute's stanza, whose
+/* Deliberate: an open resource attribute gets the range even when the line is in a class attribute's stanza, whose
  * type it is converted as. */
 void store_range(const attr_line &line) {
     cdgen &cx = line.cx;
@@ -308,7 +308,7 @@ void store_sd_display(const attr_line &line) {
     line.cx.sd.element.sd_disp_found = 1;
 }
 
-/* Text that is no number leaves the latest index, which then is not the expected one. */
+/* Text that is not a number keeps the latest index, which then is not the expected one. */
 void check_sd_index(const attr_line &line) {
     cdgen &cx = line.cx;
     vx_value_t index = {};

@@ -146,7 +146,7 @@ size_t prefill(int fd, size_t size) {
     return gross;
 }
 
-/* What is no regular file has no size and so cannot be mapped; a pipe, which might block, is not even written to. */
+/* Only regular files can be mapped; a pipe, which might block, is not even written to. */
 char *get_mapfile(cdgen &cx, size_t size) {
     output_fd out(create_output(cx));
     struct stat st = {};
@@ -236,7 +236,8 @@ private:
     cdb_dsect_anchor_t anchor;
 };
 
-/* The places of references that are none, once the class's tables have theirs. Classes are the first sections. */
+/* Notes where in the image the class's stray references are, once its tables have their places. Classes are the first
+ * sections. */
 void note_nowhere(cdgen &cx, const rsrc_class_t &record, const char *at) {
     for (; cx.stray.strays_done < cx.stray.strays.size(); ++cx.stray.strays_done) {
         const stray_reference &stray = cx.stray.strays[cx.stray.strays_done];
@@ -284,7 +285,7 @@ void add_cmmap(cdgen &cx, const rsrc_cmmap_t &staged) {
     out.finish();
 }
 
-/* The reference to the string table deliberately holds its rounded length: behind it stand the variable IDs. */
+/* The reference to the string table deliberately holds its rounded length, which is where the variable IDs begin. */
 void add_var_class(cdgen &cx, const rsrc_variable_class_t &staged) {
     section out(cx, CDB_DSECT_VAR_CLASS);
     char *at = out.write(&staged, sizeof staged);

@@ -40,7 +40,7 @@ private:
         return staged_content(named.u_rvc_string_tbl)->tbl_base + named.u_rvc_name.offset[0];
     }
 
-    /* Where the name stands, or else may be entered. */
+    /* The slot of the name, or the free slot where it may be entered. */
     size_t slot_of(std::string_view name) const {
         size_t slot = std::hash<std::string_view>()(name) % slots.size();
         while (slots[slot] != 0 && name_of(slots[slot]) != name)
@@ -57,7 +57,7 @@ private:
     std::vector<vx_uint32_t> slots; /* positions of classes, counted from 1; at least half of them are free: 0 */
 };
 
-/* A name that is no variable class's is deliberately dropped in silence. */
+/* Deliberately, a name that no variable class has is silently dropped. */
 void add_varID_to_var_class(cdgen &cx, const class_index &index, const char *srch_name, var_id_t varID) {
     rsrc_variable_class_t *rvcp = index.find(srch_name);
     if (rvcp == nullptr)

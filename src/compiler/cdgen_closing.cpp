@@ -1,4 +1,4 @@
-/* cdgen_closing.cpp: what the end of the source asks for. */
+/* cdgen_closing.cpp: the steps at the end of the source. */
 
 #include "compiler/cdgen_closing.h"
 
@@ -26,7 +26,7 @@ void drop_values(cdgen &cx) {
     cx.framing.spare_dflt = nullptr;
 }
 
-/* The ID of the last class's persistent resource attribute with the locator's name; an unknown name is no error. */
+/* The ID of the last class's persistent resource attribute with the locator's name; an unknown name is not an error. */
 vx_uint16_t locator_id(cdgen &cx) {
     tbl *strings = staged_tbl(cx.staged.cb_rsrc_class.u_rc_strings);
     for (const rsrc_pattr_t &attr : records_of<rsrc_pattr_t>(staged_tbl(cx.staged.cb_rsrc_class.u_rc_pattrs))) {
@@ -42,7 +42,7 @@ void resolve_locator(cdgen &cx) {
     cx.staged.cb_rsrc_class.rc_locator = given ? locator_id(cx) : NO_LOCATOR;
 }
 
-/* There is no stanza for the manager: it is made of its name. */
+/* No stanza describes the manager: its record is made from its name. */
 void make_manager(cdgen &cx) {
     if (cx.later.rm_name == nullptr)
         cdgen_error_exit(MSG_NO_MANAGER, nullptr, nullptr, 0, 1);

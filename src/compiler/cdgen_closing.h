@@ -1,4 +1,4 @@
-/* cdgen_closing.h: what the end of the source asks for. */
+/* cdgen_closing.h: the steps at the end of the source. */
 #ifndef CDGEN_CDGEN_CLOSING_H
 #define CDGEN_CDGEN_CLOSING_H
 

@@ -8,8 +8,8 @@
 
 struct cdgen;
 
-/* The one exception, thrown by the fatal exits and caught by the driver. The details are literals, or stand in the
- * context, or belong to the caller of the compilation; each may be null. */
+/* The one exception, thrown by the fatal exits and caught by the driver. The details are literals, or belong to the
+ * context or to the caller of the compilation; each may be null. */
 struct fatal_exit {
     message_id id; /* NO_MESSAGE: nothing is to be printed */
     const char *detail1;

@@ -1,4 +1,4 @@
-/* cdgen_framing.h: which stanza is open, and what is known of each kind's latest one. */
+/* cdgen_framing.h: which stanza is current, and the state of each kind's latest one. */
 #ifndef CDGEN_CDGEN_FRAMING_H
 #define CDGEN_CDGEN_FRAMING_H
 

@@ -16,7 +16,7 @@ template <class List> vx_uint32_t make_list(cdgen &cx, tbl *t, vx_uint32_t List:
 }
 
 /* Room for one element more of the section at an offset: the first one's is in the header. Nothing else goes into the
- * table while a run is open, so that elements stand behind one another. */
+ * table while a run is open, so its elements are adjacent. */
 size_t next_sd_field(cdgen &cx, tbl *sd_defs, size_t section) {
     if (record_at<sd_def_t>(sd_defs, section)->sd_count == 0)
         return section + offsetof(sd_def_t, sd_fields);

@@ -33,7 +33,7 @@ void default_class_name(cdgen &cx) {
 }
 
 /* Deliberate: an attribute that a new class finds open goes into the old one as it is, unchecked. If it has no valid
- * values its reference to them may still be 0, which is not "none": the reversal is told. */
+ * values its reference to them may still be 0, which is not "none", so it is noted for the reversal. */
 template <class Attribute>
 void flush_raw(cdgen &cx, Attribute &attr, cdb_ref_t rsrc_class_t::*records, vx_uint16_t found) {
     if (attr.ra_cb_ID == 0)
@@ -113,7 +113,7 @@ void init_class_tbl(cdgen &cx) {
         stage_tbl(rsrc_class.*table.ref, make_tbl(cx, table.growth, table.trace_name));
 }
 
-/* ResourceClass goes on with the record that ControlDefinition opened. */
+/* ResourceClass continues with the record that ControlDefinition opened. */
 void init_class_tbl_fake(cdgen &) {}
 
 void cmplt_class_tbl(cdgen &cx) {

@@ -16,11 +16,11 @@ namespace {
 
 constexpr int ending_signals[] = {SIGHUP, SIGINT, SIGQUIT, SIGTERM};
 
-/* Signals belong to the process and know of no context. */
+/* A signal handler cannot reach a context, so this is global. */
 std::atomic<const char *> unfinished_output = nullptr;
 static_assert(decltype(unfinished_output)::is_always_lock_free, "handlers may only use what cannot be locked");
 
-/* The program still ends by the signal, as whoever sent it wants to see; it has been given back its meaning. */
+/* The handler has already been reset, so raising the signal again ends the program by it, as its sender expects. */
 void remove_output(int signal) {
     if (const char *name = unfinished_output.exchange(nullptr))
         unlink(name);
@@ -39,10 +39,10 @@ void handle(int signal, void (*handler)(int)) {
     action.sa_handler = handler;
     action.sa_flags = static_cast<int>(SA_RESETHAND);
     if (sigaction(signal, &action, &before) == 0 && before.sa_handler == SIG_IGN)
-        sigaction(signal, &before, nullptr); /* as for what goes on when its terminal is closed */
+        sigaction(signal, &before, nullptr); /* stays ignored, as under nohup */
 }
 
-/* What the standard library does where there is no memory even for an exception. */
+/* Called by the standard library when there is no memory even for an exception. */
 [[noreturn]] void end_without_memory() {
     fprintf(stderr, "%s%s\n", message_of(MSG_OUT_OF_MEMORY).text, strerror(ENOMEM));
     _exit(ENOMEM);

@@ -14,8 +14,8 @@
 
 namespace {
 
-/* What may end a line's text before its newline: quotes and comments, and the NUL behind the last byte. They are rare.
- * Where the next one stands is found once, however many lines stand before it. */
+/* What may end a line's text before its newline: quotes, comments, and the NUL after the last byte. They are rare, so
+ * the next one is searched for once, however many lines come before it. */
 char *next_mark(char *from) {
     return from + strcspn(from, "\"#/");
 }
@@ -86,7 +86,7 @@ bool is_blank(char c) {
 }
 
 /* Where the text of a line that has marks ends: at its newline, its comment, or its NUL. Null for a line without text:
- * blanks, quotes and comments are none. */
+ * blanks, quotes and comments are not text. */
 char *end_by_marks(const source_line &line, char *p) {
     bool text_seen = false;
     bool quoted = false;

@@ -124,7 +124,7 @@ void swap_array(vx_uint32_t offset, vx_data_type_t element_type, swap_area &sbas
 }
 
 void swap_out_of_line(vx_uint32_t offset, vx_data_type_t type, swap_area &sbase_p) {
-    /* At offset 0 stands the first name of the class, never a value: a cell of 0 is one that was not filled. */
+    /* The first name of the class is at offset 0, so a cell of 0 was never filled. */
     if (offset == CDB_NONE || offset == 0 || sbase_p.nesting == swap_area::NESTING_MAX)
         return;
     ++sbase_p.nesting;
@@ -241,7 +241,7 @@ void swap_tables(const swap_section &section, const rsrc_class_t &rc, size_t fir
     }
 }
 
-/* List tables are reversed only where something refers to them; the string table only where a value stands. */
+/* List tables are reversed only where something refers to them; the string table only where there is a value. */
 void swap_class(const swap_section &section) {
     if (!section.holds(0, sizeof(rsrc_class_t)))
         return;
@@ -305,7 +305,7 @@ void swap_section_of(const cdb_dsect_anchor_t &anchor, const swap_section &secti
     }
 }
 
-/* Words that look like references and are none say so while the image is walked. Returns what they were. */
+/* Marks the words that look like references but are not as absent while the image is walked. Returns what they were. */
 std::vector<vx_uint32_t> hide_strays(char *image, std::span<const size_t> places) {
     std::vector<vx_uint32_t> words;
     for (size_t place : places) {

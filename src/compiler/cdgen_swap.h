@@ -18,7 +18,7 @@ class swap_area {
 public:
     swap_area(char *start, size_t bytes) : base(start), size(bytes), taken(bytes / ALIGNMENT) {}
 
-    /* The address of what stands at an offset: a head of head bytes, in which the word at count_at says how many
+    /* The address of the item at an offset: a head of head bytes, in which the word at count_at says how many
      * entries of entry bytes follow. Null if it is not all inside, or if it has been handed out before. */
     char *take(vx_uint32_t offset, size_t head, size_t count_at = 0, size_t entry = 0);
 
@@ -27,7 +27,7 @@ public:
     unsigned nesting = 0; /* values being reversed */
 
 private:
-    /* Lists, definitions and values stand on 8-byte boundaries; on no 4-byte boundary there is nothing. */
+    /* Bytes. The compiler starts lists, definitions and values on multiples of 8; multiples of 4 are accepted. */
     static constexpr size_t ALIGNMENT = 4;
 
     char *base;

@@ -98,7 +98,7 @@ void append_binary(vx_value_t &cell, const encoding &e, const char *block) {
         add_to_tbl(e.cx, e.strings, block + sizeof length, length);
 }
 
-/* An empty string, or a binary of no length; which deliberately is one piece in a scalar and two in an array. */
+/* An empty string, or a binary of length 0; deliberately, the binary is one piece in a scalar and two in an array. */
 void append_empty(vx_value_t &cell, const encoding &e) {
     constexpr char nothing[sizeof(vx_binary_t)] = {};
     if (e.type == VX_CHAR_PTR)
@@ -168,7 +168,7 @@ template <class Write> auto with_cell(tbl *str_tbl, size_t offset, Write write) 
     return result;
 }
 
-/* Types that are no value here: fatal. */
+/* Types that cannot be copied here are fatal. */
 void refuse(vx_data_type_t type) {
     message_id message = type == VX_SD_PTR         ? MSG_SD_NOT_COPIED
                          : type == VX_SD_PTR_ARRAY ? MSG_SD_ARRAY_NOT_COPIED

@@ -49,8 +49,8 @@ tbl *make_tbl(cdgen &cx, size_t au, const char *name) {
 
 namespace {
 
-/* The request rounded up to whole units. The quotient is deliberately formed in single precision, as it always was;
- * where that loses integers, beyond 2^24 bytes, the chunk may come out short, and is then computed exactly. */
+/* The request rounded up to whole units. The quotient is deliberately formed in single precision, which the traces
+ * show; where that loses integers, beyond 2^24 bytes, the chunk may come out short, and is then computed exactly. */
 size_t growth_chunk(const tbl &t, size_t s) {
     if (s == 0)
         return t.tbl_au;
@@ -60,7 +60,7 @@ size_t growth_chunk(const tbl &t, size_t s) {
 }
 
 /* Memory for the table's first or next bytes. Half as much again is asked for, so that a large table does not move at
- * every unit; if that is not to be had, just what is needed. */
+ * every unit; if there is not that much memory, just what is needed. */
 char *larger_block(tbl &t, size_t needed) {
     size_t generous = std::max(needed, t.tbl_capacity + t.tbl_capacity / 2);
     for (size_t capacity : {generous, needed}) {

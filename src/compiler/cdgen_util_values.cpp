@@ -29,12 +29,12 @@ bool conversion_failed(const cdgen &cx) {
     return cx.conv_errno == ERANGE || cx.conv_errno == EINVAL;
 }
 
-/* More than 9 for what is no decimal digit. */
+/* More than 9 if the character is not a decimal digit. */
 unsigned digit_of(char c) {
     return static_cast<unsigned>(c) - '0';
 }
 
-/* Plain decimal text of at most 18 digits, which is most of what is written: the C library's result, without it. Null
+/* Plain decimal text of at most 18 digits, as most numbers are: the C library's result without calling it. Null
  * where its rules are wanted. */
 const char *plain_decimal(const char *text, vx_uint64_t *value) {
     constexpr int SAFE_DIGITS = 18;

@@ -8,7 +8,7 @@
 
 #include <cstddef>
 
-/* What a serialised value stands for. */
+/* What is serialised. */
 enum type_out_mode {
     TYPE_SAME = 1, /* the given value */
     TYPE_16 = 2,   /* the given integer, narrowed to 16 bits */
@@ -27,8 +27,8 @@ int strToVar(const char *s, orb_variable_type_t *t);
 /* Integers by the rules of the C library, base 0, 8 or 10. An overflow is remembered in cx.conv_errno. */
 long int_from_text(cdgen &cx, const char *text, char **end, int base);
 
-/* Converts text into *vx_out, for an array type into one element; 0, or -1 if the text is no value of the type. Texts
- * and binaries stand in the pool. */
+/* Converts text into *vx_out, for an array type into one element; 0, or -1 if the text is not a value of the type.
+ * Texts and binaries are stored in the pool. */
 int str_to_vx(cdgen &cx, vx_value_t *vx_out, vx_data_type_t vx_type, const char *str_in, text_pool &pool);
 /* Decode into a block of a 32-bit length and bytes, for which vx_out must have room: 0, or -1 on malformed text.
  * oct_convert knows two forms of output: 1, text with a NUL at its end; 2, such a block. */

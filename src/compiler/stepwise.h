@@ -25,7 +25,7 @@ public:
      * before it is still the current one. */
     void take_line(const attr_text &text);
 
-    /* What the end of the source asks for, in this order. */
+    /* The steps at the end of the source, to be taken in this order. */
     static size_t closing_steps();
     void take_closing_step(size_t step);
     void size_image();

@@ -90,7 +90,7 @@ struct table_attrs {
     int ta_type;         /* attr_type */
     int ta_offset;       /* of the field in the stanza's staging record */
     vx_uint32_t req_bit; /* the attribute's bit in req_mask or, with OPTIONAL added, in opt_mask */
-    int dup_allowed;     /* may stand several times in one stanza */
+    int dup_allowed;     /* may be given several times in one stanza */
     size_t ta_length = std::string_view(ta_name).size();
 };
 

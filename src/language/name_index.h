@@ -48,7 +48,7 @@ private:
         return true;
     }
 
-    std::uint64_t multiplier = 0x9E3779B97F4A7C15; /* odd, of no meaning: the search begins here */
+    std::uint64_t multiplier = 0x9E3779B97F4A7C15; /* odd, otherwise arbitrary: the search begins here */
     std::array<std::int8_t, 1U << SLOT_BITS> slots = {};
 };
 

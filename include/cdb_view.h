@@ -810,7 +810,7 @@ public:
 
     /** The manager whose section these bytes are. database::managers() makes them. */
     explicit manager(const bytes &section)
-        : fields(section.record<rsrc_mgr_t>(0)), strings(section.part(sizeof(rsrc_mgr_t))) {}
+        : fields(section.record<rsrc_mgr_t>(0)), texts(section.part(sizeof(rsrc_mgr_t))) {}
 
     /** The manager's record as in cdb.h, in the byte order of this machine. It is valid as long as this object. */
     const rsrc_mgr_t &record() const {
@@ -818,12 +818,16 @@ public:
     }
     /** The manager's name. */
     std::string_view name() const {
-        return strings.text(fields.u_rm_RMname);
+        return texts.text(fields.u_rm_RMname);
+    }
+    /** The strings of the section, which references in the record lead into. */
+    const bytes &strings() const {
+        return texts;
     }
 
 private:
     rsrc_mgr_t fields;
-    bytes strings;
+    bytes texts;
 };
 
 /** A class-to-manager map section: which manager serves a class, and where the class's messages are. */
@@ -834,7 +838,7 @@ public:
 
     /** The map whose section these bytes are. database::maps() makes them. */
     explicit class_map(const bytes &section) : fields(section.record<rsrc_cmmap_t>(0)) {
-        strings = section.part(fields.u_rcm_strings.offset[0]);
+        texts = section.part(fields.u_rcm_strings.offset[0]);
     }
 
     /**
@@ -846,12 +850,16 @@ public:
     }
     /** The file name of the message catalog; empty if none was given. */
     std::string_view message_catalog() const {
-        return strings.text(fields.u_rcm_msg_file);
+        return texts.text(fields.u_rcm_msg_file);
+    }
+    /** The strings of the section, which references in the record lead into. */
+    const bytes &strings() const {
+        return texts;
     }
 
 private:
     rsrc_cmmap_t fields;
-    bytes strings;
+    bytes texts;
 };
 
 /** A dynamic attribute of a variable class. */
@@ -880,7 +888,7 @@ public:
     /** The variable class whose section these bytes are. database::variable_classes() makes them. */
     explicit variable_class(const bytes &whole)
         : fields(whole.record<rsrc_variable_class_t>(0)), section(whole),
-          strings(whole.part(sizeof fields, fields.u_rvc_string_tbl.offset[0])) {}
+          texts(whole.part(sizeof fields, fields.u_rvc_string_tbl.offset[0])) {}
 
     /**
      * The record as in cdb.h, in the byte order of this machine: the two intervals. It is valid as long as this object.
@@ -890,11 +898,15 @@ public:
     }
     /** The variable class's name. */
     std::string_view name() const {
-        return strings.text(fields.u_rvc_name);
+        return texts.text(fields.u_rvc_name);
     }
     /** Its other name; empty if there is none. */
     std::string_view alias() const {
-        return strings.text(fields.u_rvc_compat_name);
+        return texts.text(fields.u_rvc_compat_name);
+    }
+    /** The strings of the section, which references in the record lead into. */
+    const bytes &strings() const {
+        return texts;
     }
     /** The dynamic attributes that belong to it: those of the class first, then those of its resources. */
     list_of<variable_id, bytes> variable_ids() const {
@@ -905,7 +917,7 @@ public:
 private:
     rsrc_variable_class_t fields;
     bytes section;
-    bytes strings;
+    bytes texts;
 };
 
 /* ---- The database ---------------------------------------------------------------------------------------------- */

@@ -4,6 +4,7 @@
 #include "compare/compare.h"
 #include "compare/fields.h"
 #include "format/sections.h"
+#include "reader/tables.h"
 
 namespace cdef {
 
@@ -39,7 +40,7 @@ private:
     void add_dependencies(thing &to, const rsrc_class_t &rc, const cdb::bytes &section);
     thing resource_class(const cdb::bytes &section);
     thing class_hash(const cdb::bytes &section);
-    thing variable_class(const cdb::bytes &section);
+    thing variable_class(const cdb::bytes &section, const cdb::class_tables &tables);
     thing section(std::size_t index);
 
     const cdb::database &db;
@@ -214,10 +215,8 @@ thing builder::resource_class(const cdb::bytes &section) {
     return made;
 }
 
-thing builder::variable_class(const cdb::bytes &section) {
+thing builder::variable_class(const cdb::bytes &section, const cdb::class_tables &tables) {
     cdb::variable_class view(section);
-    cdb::class_tables tables;
-    tables.strings = section.part(sizeof(rsrc_variable_class_t), view.record().u_rvc_string_tbl.offset[0]);
     thing made = record<rsrc_variable_class_t>("ResourceVariableClass", section, 0, tables);
     for (const cdb::variable_id &id : view.variable_ids())
         made.parts.push_back({id.of_class() ? "class variable" : "variable",
@@ -230,17 +229,15 @@ thing builder::variable_class(const cdb::bytes &section) {
 thing builder::section(std::size_t index) {
     cdb::bytes bytes = db.section(index);
     cdb_dsect_type_t type = db.anchor(index).cda_type;
-    cdb::class_tables tables;
+    cdb::class_tables tables = cdb::tables_of(db, index);
     switch (type) {
     case CDB_DSECT_CLASS:
         return resource_class(bytes);
     case CDB_DSECT_VAR_CLASS:
-        return variable_class(bytes);
+        return variable_class(bytes, tables);
     case CDB_DSECT_RSRC_MGR:
-        tables.strings = bytes.part(sizeof(rsrc_mgr_t));
         return record<rsrc_mgr_t>("ResourceManager", bytes, 0, tables);
     case CDB_DSECT_CMMAP:
-        tables.strings = bytes.part(bytes.record<rsrc_cmmap_t>(0).u_rcm_strings.offset[0]);
         return record<rsrc_cmmap_t>("ClassToManagerMapping", bytes, 0, tables);
     case CDB_DSECT_CLASS_HASH:
         return class_hash(bytes);

@@ -72,9 +72,6 @@ vx_data_type_t data_type_in(const cdb::record_format &format, const cdb::bytes &
 /* A value that stands in its cell, or is none. */
 fact fact_of(const cdb::value &value);
 
-/* The tables that a section's references lead into. */
-cdb::class_tables tables_of(const cdb::database &db, std::size_t section);
-
 /* Of the list table that a reference leads into; not for other targets. */
 const cdb::bytes &lists_of(const cdb::class_tables &tables, cdb::target to);
 

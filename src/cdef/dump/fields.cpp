@@ -174,27 +174,6 @@ vx_data_type_t data_type_in(const cdb::record_format &format, const cdb::bytes &
     return format.type == nullptr ? VX_UNKNOWN : static_cast<vx_data_type_t>(number_in(area, at, *format.type));
 }
 
-cdb::class_tables tables_of(const cdb::database &db, std::size_t section) {
-    cdb::bytes whole = db.section(section);
-    auto strings_at = [&](std::size_t at, std::size_t size = SIZE_MAX) {
-        return cdb::class_tables{
-            .section = whole, .strings = whole.part(at, size), .valid_vals = {}, .variety_lists = {}, .sd_defs = {}};
-    };
-    switch (db.anchor(section).cda_type) {
-    case CDB_DSECT_CLASS:
-        return cdb::resource_class(whole).side_tables();
-    case CDB_DSECT_RSRC_MGR:
-        return strings_at(sizeof(rsrc_mgr_t));
-    case CDB_DSECT_CMMAP:
-        return strings_at(whole.record<rsrc_cmmap_t>(0).u_rcm_strings.offset[0]);
-    case CDB_DSECT_VAR_CLASS:
-        return strings_at(sizeof(rsrc_variable_class_t),
-                          whole.record<rsrc_variable_class_t>(0).u_rvc_string_tbl.offset[0]);
-    default:
-        return strings_at(whole.size());
-    }
-}
-
 const cdb::bytes &lists_of(const cdb::class_tables &tables, cdb::target to) {
     return to == cdb::target::variety_lists ? tables.variety_lists
            : to == cdb::target::valid_vals  ? tables.valid_vals

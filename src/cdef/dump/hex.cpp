@@ -4,6 +4,7 @@
 #include "text/hex.h"
 #include "cdef/dump/dump.h"
 #include "cdef/support/output.h"
+#include "reader/tables.h"
 #include "text/append.h"
 #include "text/shown.h"
 
@@ -71,7 +72,7 @@ const cdb::class_tables &hex_form::tables(const cdb::region &r) {
     std::size_t section = r.section.value();
     std::optional<cdb::class_tables> &known = sections.at(section);
     if (!known)
-        known = tables_of(db, section);
+        known = cdb::tables_of(db, section);
     return *known;
 }
 

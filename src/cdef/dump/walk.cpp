@@ -2,6 +2,7 @@
 
 #include "cdef/dump/dump.h"
 #include "reader/ownership.h"
+#include "reader/tables.h"
 
 #include "format/sections.h"
 #include "text/shown.h"
@@ -289,7 +290,7 @@ void walker::show_hash_blocks(const cdb::bytes &section) {
 }
 
 void walker::show_root(std::size_t index, const cdb::section_kind &kind) {
-    record_at root = {*kind.root, db.section(index), 0, tables_of(db, index)};
+    record_at root = {*kind.root, db.section(index), 0, cdb::tables_of(db, index)};
     open(root, kind.key, std::string(kind.title));
     show_fields(root);
     if (kind.type == CDB_DSECT_CLASS)

@@ -1,25 +1,26 @@
-/* compare.cpp: what differs between two trees of things, and which differences break readers. */
+/* compare.cpp: what differs between two trees, and which differences break readers. */
 
 #include "compare/compare.h"
 
 #include <map>
-#include <utility>
+#include <tuple>
 
-namespace cdef {
+namespace compare {
 
 namespace {
 
-using identity = std::pair<std::string_view, std::string_view>; /* kind and name */
+/* The kind, the field that leads to an element, and the name. */
+using identity = std::tuple<node_kind, const cdb::field_fact *, std::string_view>;
 
-identity identity_of(const thing &t) {
-    return {t.kind, t.name};
+identity identity_of(const node &n) {
+    return {n.kind, n.field, n.name};
 }
 
 class comparison {
 public:
     explicit comparison(std::vector<difference> &to) : found(to) {}
 
-    void compare(const thing &before, const thing &after) {
+    void compare(const node &before, const node &after) {
         path.push_back(&after);
         compare_facts(before, after);
         compare_parts(before, after);
@@ -28,18 +29,18 @@ public:
 
 private:
     /* Both are of one kind, and so have the same facts in the same order. */
-    void compare_facts(const thing &before, const thing &after) {
+    void compare_facts(const node &before, const node &after) {
         for (std::size_t i = 0; i < before.facts.size() && i < after.facts.size(); ++i)
             if (before.facts[i].text != after.facts[i].text)
                 found.push_back({change::changed, path, &before.facts[i], &after.facts[i]});
     }
 
-    /* Parts pair by kind and name, equal ones in their order. */
-    void compare_parts(const thing &before, const thing &after) {
-        std::map<identity, std::vector<const thing *>> unpaired;
+    /* Parts pair by identity, those of one identity in their order. */
+    void compare_parts(const node &before, const node &after) {
+        std::map<identity, std::vector<const node *>> unpaired;
         for (std::size_t i = after.parts.size(); i > 0; --i)
             unpaired[identity_of(after.parts[i - 1])].push_back(&after.parts[i - 1]);
-        for (const thing &part : before.parts) {
+        for (const node &part : before.parts) {
             auto candidates = unpaired.find(identity_of(part));
             if (candidates == unpaired.end() || candidates->second.empty()) {
                 add(change::removed, part);
@@ -51,9 +52,9 @@ private:
         add_new(after, unpaired);
     }
 
-    /* Of equal ones the last are left over, the very last in front. */
-    void add_new(const thing &after, std::map<identity, std::vector<const thing *>> &unpaired) {
-        for (const thing &part : after.parts) {
+    /* Of parts of one identity the last ones are left, the very last in front. */
+    void add_new(const node &after, std::map<identity, std::vector<const node *>> &unpaired) {
+        for (const node &part : after.parts) {
             auto &left = unpaired[identity_of(part)];
             if (left.empty() || left.back() != &part)
                 continue;
@@ -62,38 +63,29 @@ private:
         }
     }
 
-    void add(change what, const thing &part) {
+    void add(change what, const node &part) {
         path.push_back(&part);
         found.push_back({what, path});
         path.pop_back();
     }
 
     std::vector<difference> &found;
-    std::vector<const thing *> path;
+    std::vector<const node *> path;
 };
-
-bool is_element(const thing &t) {
-    return t.kind.ends_with("element");
-}
-
-/* What readers look for by name or by number. */
-bool is_looked_for(const thing &t) {
-    return t.kind == "ResourceClass" || t.kind.ends_with("Attribute") || t.kind.ends_with("Action");
-}
 
 } // namespace
 
-std::vector<difference> differences(const thing &before, const thing &after) {
+std::vector<difference> differences(const node &before, const node &after) {
     std::vector<difference> found;
     comparison(found).compare(before, after);
     return found;
 }
 
 std::string_view breach(const difference &d) {
-    const thing &about = *d.path.back();
-    if (d.what != change::changed && is_element(about))
+    node_kind kind = d.path.back()->kind;
+    if (d.what != change::changed && kind == node_kind::element)
         return "another layout of the structure";
-    if (d.what == change::removed && is_looked_for(about))
+    if (d.what == change::removed && row_of(kind).is_looked_for)
         return "readers miss it";
     if (d.what != change::changed)
         return {};
@@ -107,4 +99,4 @@ std::string_view breach(const difference &d) {
     return {};
 }
 
-} // namespace cdef
+} // namespace compare

@@ -6,7 +6,7 @@
 #include "text/append.h"
 #include "text/hex.h"
 
-namespace cdef {
+namespace compare {
 
 namespace {
 
@@ -66,4 +66,4 @@ std::string text_of_number(std::uint32_t number, cdb::meaning as) {
     }
 }
 
-} // namespace cdef
+} // namespace compare

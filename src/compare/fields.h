@@ -6,7 +6,7 @@
 
 #include <string>
 
-namespace cdef {
+namespace compare {
 
 /* Names joined with "+"; bits without a name in hexadecimal; "none". */
 std::string text_of_bits(std::uint32_t bits, std::span<const props_t> known);
@@ -14,6 +14,6 @@ std::string text_of_bits(std::uint32_t bits, std::span<const props_t> known);
 /* The number of a field that means this. The database is sound. */
 std::string text_of_number(std::uint32_t number, cdb::meaning as);
 
-} // namespace cdef
+} // namespace compare
 
 #endif

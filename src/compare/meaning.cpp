@@ -3,14 +3,13 @@
 
 #include "compare/compare.h"
 #include "compare/fields.h"
+#include "compare/text.h"
 #include "format/sections.h"
 #include "reader/tables.h"
 
-namespace cdef {
+namespace compare {
 
 namespace {
-
-constexpr const char *VALID_VALUE = "valid value";
 
 template <class Record> const cdb::field_fact &fact_of(std::size_t offset) {
     return cdb::format_for<Record>.fact_at(offset);
@@ -19,83 +18,85 @@ template <class Record> const cdb::field_fact &fact_of(std::size_t offset) {
 class builder {
 public:
     builder(const cdb::database &database, const cdb::ownership &ownership)
-        : db(database), owners(ownership), tell(database.file().size()) {}
+        : db(database), owners(ownership), writer(database.file().size()) {}
 
-    thing whole();
+    node whole();
 
 private:
     template <class Record>
-    thing record(std::string_view kind, const cdb::bytes &area, std::size_t at, const cdb::class_tables &tables);
-    void add_text(thing &to, const cdb::field_fact &what, std::string_view text);
-    void add_reference(thing &to, const cdb::field &f, const cdb::field_fact &what, const cdb_ref_t &ref,
+    node record(node_kind kind, const cdb::bytes &area, std::size_t at, const cdb::class_tables &tables);
+    void add_text(node &to, const cdb::field_fact &what, std::string_view text);
+    void add_reference(node &to, const cdb::field &f, const cdb::field_fact &what, const cdb_ref_t &ref,
                        const cdb::class_tables &tables, vx_data_type_t type);
-    void add_value(thing &to, const cdb::field_fact &what, const cdb::value &value, bool is_own,
+    void add_value(node &to, const cdb::field_fact &what, const cdb::value &value, bool is_own,
                    const cdb::bytes &strings);
-    void add_varieties(thing &to, const cdb::variety_list &varieties);
-    void add_valid_values(thing &to, const cdb::valid_value_list &values, const cdb::class_tables &tables);
-    void add_elements(thing &to, const cdb::field_fact &what, const cdb_ref_t &ref, const cdb::class_tables &tables);
+    void add_varieties(node &to, const cdb::variety_list &varieties);
+    void add_valid_values(node &to, const cdb::valid_value_list &values, const cdb::class_tables &tables);
+    void add_elements(node &to, const cdb::field_fact &what, const cdb_ref_t &ref, const cdb::class_tables &tables);
     template <class Record>
-    void add_records(thing &to, table from, const cdb::class_tables &tables, const cdb_ref_t &first, std::size_t count);
-    void add_errors(thing &to, const rsrc_class_t &rc, const cdb::class_tables &tables);
-    void add_dependencies(thing &to, const rsrc_class_t &rc, const cdb::bytes &section);
-    thing resource_class(const cdb::bytes &section);
-    thing class_hash(const cdb::bytes &section);
-    thing variable_class(const cdb::bytes &section, const cdb::class_tables &tables);
-    thing section(std::size_t index);
+    void add_records(node &to, node_kind kind, const cdb::class_tables &tables, const cdb_ref_t &first,
+                     std::size_t count);
+    void add_errors(node &to, const rsrc_class_t &rc, const cdb::class_tables &tables);
+    void add_dependencies(node &to, const rsrc_class_t &rc, const cdb::bytes &section);
+    node resource_class(const cdb::bytes &section);
+    node class_hash(const cdb::bytes &section);
+    node variable_class(const cdb::bytes &section, const cdb::class_tables &tables);
+    node section(std::size_t index);
 
     const cdb::database &db;
     const cdb::ownership &owners;
-    teller tell;
+    value_writer writer;
 };
 
-void add_number(thing &to, const cdb::field_fact &what, std::uint32_t number) {
+void add_number(node &to, const cdb::field_fact &what, std::uint32_t number) {
     to.facts.push_back({&what, text_of_number(number, what.as)});
 }
 
-void builder::add_text(thing &to, const cdb::field_fact &what, std::string_view text) {
+void builder::add_text(node &to, const cdb::field_fact &what, std::string_view text) {
     if (what.is == cdb::role::NAME)
-        to.name = tell.text_of(text);
+        to.name = writer.text_of(text);
     else
-        to.facts.push_back({&what, text.empty() ? "nothing" : tell.text_of(text)});
+        to.facts.push_back({&what, text.empty() ? "nothing" : writer.text_of(text)});
 }
 
-void builder::add_value(thing &to, const cdb::field_fact &what, const cdb::value &value, bool is_own,
+void builder::add_value(node &to, const cdb::field_fact &what, const cdb::value &value, bool is_own,
                         const cdb::bytes &strings) {
     bool bound = what.as == cdb::meaning::BOUND;
-    std::string text = bound ? tell.text_of_bound(value, is_own, strings, owners) : tell.text_of(value, strings);
+    std::string text = bound ? writer.text_of_bound(value, is_own, strings, owners) : writer.text_of(value, strings);
     to.facts.push_back({&what, std::move(text)});
 }
 
-void builder::add_varieties(thing &to, const cdb::variety_list &varieties) {
+void builder::add_varieties(node &to, const cdb::variety_list &varieties) {
     for (const cdb::variety &v : varieties)
-        to.parts.push_back({"variety", std::to_string(v.low) + " to " + std::to_string(v.high), {}, {}});
+        to.parts.push_back({node_kind::variety, std::to_string(v.low) + " to " + std::to_string(v.high)});
 }
 
-void builder::add_valid_values(thing &to, const cdb::valid_value_list &values, const cdb::class_tables &tables) {
+void builder::add_valid_values(node &to, const cdb::valid_value_list &values, const cdb::class_tables &tables) {
     for (const cdb::valid_value &v : values) {
-        std::string text = tell.text_of(v.low, tables.strings);
-        std::string high = tell.text_of(v.high, tables.strings);
+        std::string text = writer.text_of(v.low, tables.strings);
+        std::string high = writer.text_of(v.high, tables.strings);
         if (text != high)
             text.append(" to ").append(high);
-        thing entry = {VALID_VALUE, text, {}, {}};
+        node entry = {node_kind::valid_value, text};
         entry.facts.push_back({&fact_of<vv_entry_t>(offsetof(vv_entry_t, vv_disp_msgid)), std::to_string(v.message)});
         to.parts.push_back(std::move(entry));
     }
 }
 
 /* An element's place in the structure is part of what it means. */
-void builder::add_elements(thing &to, const cdb::field_fact &what, const cdb_ref_t &ref,
+void builder::add_elements(node &to, const cdb::field_fact &what, const cdb_ref_t &ref,
                            const cdb::class_tables &tables) {
     std::size_t count = cdb::sd_definition_at(tables, ref).size();
     std::size_t at = ref.offset[0] + offsetof(sd_def_t, sd_fields);
     for (std::size_t i = 0; i < count; ++i, at += sizeof(sd_field_t)) {
-        thing element = record<sd_field_t>(what.label(), tables.sd_defs, at, tables);
+        node element = record<sd_field_t>(node_kind::element, tables.sd_defs, at, tables);
+        element.field = &what;
         element.facts.insert(element.facts.begin(), {&ELEMENT_INDEX, std::to_string(i)});
         to.parts.push_back(std::move(element));
     }
 }
 
-void builder::add_reference(thing &to, const cdb::field &f, const cdb::field_fact &what, const cdb_ref_t &ref,
+void builder::add_reference(node &to, const cdb::field &f, const cdb::field_fact &what, const cdb_ref_t &ref,
                             const cdb::class_tables &tables, vx_data_type_t type) {
     if (what.as == cdb::meaning::UNUSED)
         return add_number(to, what, ref.offset[0]);
@@ -111,7 +112,7 @@ void builder::add_reference(thing &to, const cdb::field &f, const cdb::field_fac
     }
 }
 
-/* The one data type that a record knows of itself. */
+/* The data type that a record names; VX_UNKNOWN if it names none. */
 template <class Record> vx_data_type_t type_of(const Record &record) {
     if constexpr (requires { record.ra_data_type; })
         return record.ra_data_type;
@@ -128,11 +129,11 @@ template <class Field> Field load(const std::byte *from) {
 }
 
 template <class Record>
-thing builder::record(std::string_view kind, const cdb::bytes &area, std::size_t at, const cdb::class_tables &tables) {
+node builder::record(node_kind kind, const cdb::bytes &area, std::size_t at, const cdb::class_tables &tables) {
     auto copy = area.record<Record>(at);
     const auto *bytes = reinterpret_cast<const std::byte *>(&copy);
     vx_data_type_t type = type_of(copy);
-    thing made = {std::string(kind), {}, {}, {}};
+    node made = {kind};
     const cdb::record_format &format = cdb::format_for<Record>;
     for (std::size_t i = 0; i < format.fields.size(); ++i) {
         const cdb::field &f = format.fields[i];
@@ -152,40 +153,40 @@ thing builder::record(std::string_view kind, const cdb::bytes &area, std::size_t
 }
 
 template <class Record>
-void builder::add_records(thing &to, table from, const cdb::class_tables &tables, const cdb_ref_t &first,
+void builder::add_records(node &to, node_kind kind, const cdb::class_tables &tables, const cdb_ref_t &first,
                           std::size_t count) {
     std::size_t at = first.offset[0];
     for (std::size_t i = 0; i < count; ++i, at += sizeof(Record))
-        to.parts.push_back(
-            record<Record>(cdb::side_tables[static_cast<std::size_t>(from)].stanza, tables.section, at, tables));
+        to.parts.push_back(record<Record>(kind, tables.section, at, tables));
 }
 
-/* A table of errors or dependencies whose place is 0, where the class stands, has no place: nothing can be known of it
- * but its count, which is a field of the class. */
+/* A table of errors or dependencies at offset 0, where the class record is, has no place: only its count is known,
+ * which is a field of the class. */
 template <class Record> std::size_t count_placed(const cdb::bytes &section, const cdb_ref_t &first, std::size_t count) {
     std::size_t at = first.offset[0];
     return at == 0 ? 0 : cdb::count_inside(section, at, count, sizeof(Record));
 }
 
-void builder::add_errors(thing &to, const rsrc_class_t &rc, const cdb::class_tables &tables) {
+void builder::add_errors(node &to, const rsrc_class_t &rc, const cdb::class_tables &tables) {
     std::size_t at = rc.u_rc_errors.offset[0];
     std::size_t count = count_placed<rsrc_error_t>(tables.section, rc.u_rc_errors, rc.rc_num_errors);
     for (std::size_t i = 0; i < count; ++i, at += sizeof(rsrc_error_t))
-        to.parts.push_back(record<rsrc_error_t>("error", tables.section, at, tables));
+        to.parts.push_back(record<rsrc_error_t>(node_kind::error, tables.section, at, tables));
 }
 
-void builder::add_dependencies(thing &to, const rsrc_class_t &rc, const cdb::bytes &section) {
+void builder::add_dependencies(node &to, const rsrc_class_t &rc, const cdb::bytes &section) {
     std::size_t at = rc.u_rc_depends.offset[0];
     std::size_t count = count_placed<rsrc_depend_t>(section, rc.u_rc_depends, rc.rc_num_depends);
     for (std::size_t i = 0; i < count; ++i, at += sizeof(rsrc_depend_t)) {
-        to.parts.push_back(record<rsrc_depend_t>("dependency", section, at, {}));
+        to.parts.push_back(record<rsrc_depend_t>(node_kind::dependency, section, at, {}));
         to.parts.back().name = std::to_string(section.record<rsrc_depend_t>(at).rd_class_ID);
     }
 }
 
-/* The heads and links of its chains are places. So are the references to classes: they have no base that is known. */
-thing builder::class_hash(const cdb::bytes &section) {
-    thing made = {"class hash", {}, {}, {}};
+/* The heads and links of its chains are places, and so are the references to classes, which count from an unknown
+ * base. */
+node builder::class_hash(const cdb::bytes &section) {
+    node made = {node_kind::class_hash};
     add_number(made, fact_of<rsrc_class_hash_t>(offsetof(rsrc_class_hash_t, rch_cb_ID)),
                section.number<std::uint32_t>(0));
     std::size_t at = offsetof(rsrc_class_hash_t, rc_hash_blocks);
@@ -193,40 +194,38 @@ thing builder::class_hash(const cdb::bytes &section) {
         cdb::count_inside(section, at, section.number<std::uint32_t>(offsetof(rsrc_class_hash_t, rch_num_hash_blocks)),
                           sizeof(rc_hash_block_t));
     for (std::size_t i = 0; i < count; ++i, at += sizeof(rc_hash_block_t)) {
-        made.parts.push_back(record<rc_hash_block_t>("block", section, at, {}));
+        made.parts.push_back(record<rc_hash_block_t>(node_kind::hash_block, section, at, {}));
         made.parts.back().name = std::to_string(section.record<rc_hash_block_t>(at).rch_class_id);
     }
     return made;
 }
 
-thing builder::resource_class(const cdb::bytes &section) {
+node builder::resource_class(const cdb::bytes &section) {
     cdb::resource_class view(section);
     const rsrc_class_t &rc = view.record();
     const cdb::class_tables &tables = view.side_tables();
-    thing made = record<rsrc_class_t>("ResourceClass", section, 0, tables);
-    add_records<rsrc_pattr_t>(made, table::persistent_attributes, tables, rc.u_rc_pattrs, rc.rc_num_pattrs);
-    add_records<rsrc_pattr_t>(made, table::persistent_class_attributes, tables, rc.u_rc_pattrsC, rc.rc_num_pattrsC);
-    add_records<rsrc_dattr_t>(made, table::dynamic_attributes, tables, rc.u_rc_dattrs, rc.rc_num_dattrs);
-    add_records<rsrc_dattr_t>(made, table::dynamic_class_attributes, tables, rc.u_rc_dattrsC, rc.rc_num_dattrsC);
-    add_records<rsrc_action_t>(made, table::actions, tables, rc.u_rc_actions, rc.rc_num_actions);
-    add_records<rsrc_action_t>(made, table::class_actions, tables, rc.u_rc_actionsC, rc.rc_num_actionsC);
+    node made = record<rsrc_class_t>(node_kind::resource_class, section, 0, tables);
+    add_records<rsrc_pattr_t>(made, node_kind::persistent_attribute, tables, rc.u_rc_pattrs, rc.rc_num_pattrs);
+    add_records<rsrc_pattr_t>(made, node_kind::persistent_class_attribute, tables, rc.u_rc_pattrsC, rc.rc_num_pattrsC);
+    add_records<rsrc_dattr_t>(made, node_kind::dynamic_attribute, tables, rc.u_rc_dattrs, rc.rc_num_dattrs);
+    add_records<rsrc_dattr_t>(made, node_kind::dynamic_class_attribute, tables, rc.u_rc_dattrsC, rc.rc_num_dattrsC);
+    add_records<rsrc_action_t>(made, node_kind::action, tables, rc.u_rc_actions, rc.rc_num_actions);
+    add_records<rsrc_action_t>(made, node_kind::class_action, tables, rc.u_rc_actionsC, rc.rc_num_actionsC);
     add_errors(made, rc, tables);
     add_dependencies(made, rc, tables.section);
     return made;
 }
 
-thing builder::variable_class(const cdb::bytes &section, const cdb::class_tables &tables) {
+node builder::variable_class(const cdb::bytes &section, const cdb::class_tables &tables) {
     cdb::variable_class view(section);
-    thing made = record<rsrc_variable_class_t>("ResourceVariableClass", section, 0, tables);
+    node made = record<rsrc_variable_class_t>(node_kind::variable_class, section, 0, tables);
     for (const cdb::variable_id &id : view.variable_ids())
-        made.parts.push_back({id.of_class() ? "class variable" : "variable",
-                              std::to_string(id.number & ~(id.of_class() ? VAR_ID_CLASS_ATTR : 0)),
-                              {},
-                              {}});
+        made.parts.push_back({id.of_class() ? node_kind::class_variable : node_kind::variable,
+                              std::to_string(id.number & ~(id.of_class() ? VAR_ID_CLASS_ATTR : 0))});
     return made;
 }
 
-thing builder::section(std::size_t index) {
+node builder::section(std::size_t index) {
     cdb::bytes bytes = db.section(index);
     cdb_dsect_type_t type = db.anchor(index).cda_type;
     cdb::class_tables tables = cdb::tables_of(db, index);
@@ -236,21 +235,23 @@ thing builder::section(std::size_t index) {
     case CDB_DSECT_VAR_CLASS:
         return variable_class(bytes, tables);
     case CDB_DSECT_RSRC_MGR:
-        return record<rsrc_mgr_t>("ResourceManager", bytes, 0, tables);
+        return record<rsrc_mgr_t>(node_kind::manager, bytes, 0, tables);
     case CDB_DSECT_CMMAP:
-        return record<rsrc_cmmap_t>("ClassToManagerMapping", bytes, 0, tables);
+        return record<rsrc_cmmap_t>(node_kind::map, bytes, 0, tables);
     case CDB_DSECT_CLASS_HASH:
         return class_hash(bytes);
-    case CDB_DSECT_UNUSED:
     case CDB_DSECT_EMPTY:
+        return {node_kind::empty_section};
     case CDB_DSECT_TBL_CNTRS:
+        return {node_kind::counters_section};
+    case CDB_DSECT_UNUSED: /* a readable database has no section of any other type */
         break;
     }
-    return {"section of type " + std::to_string(type), {}, {}, {}};
+    return {node_kind::unused_section};
 }
 
-thing builder::whole() {
-    thing made = record<orb_cdb_header_t>("database", db.file(), 0, {});
+node builder::whole() {
+    node made = record<orb_cdb_header_t>(node_kind::database, db.file(), 0, {});
     for (std::size_t i = 0; i < db.section_count(); ++i) {
         made.parts.push_back(section(i));
         add_number(made.parts.back(), fact_of<cdb_dsect_anchor_t>(offsetof(cdb_dsect_anchor_t, cda_revision)),
@@ -261,8 +262,8 @@ thing builder::whole() {
 
 } // namespace
 
-thing meaning_of(const cdb::database &db, const cdb::ownership &owners) {
+node meaning_of(const cdb::database &db, const cdb::ownership &owners) {
     return builder(db, owners).whole();
 }
 
-} // namespace cdef
+} // namespace compare

@@ -1,20 +1,21 @@
 /* text.cpp: texts and values as a person reads them. */
 
-#include "compare/compare.h"
+#include "compare/text.h"
 
 #include "text/append.h"
 #include "text/hex.h"
 #include "text/number.h"
 #include "text/shown.h"
 
-namespace cdef {
+namespace compare {
 
 namespace {
 
 constexpr std::size_t TIMES_FILE = 16;
 constexpr std::size_t AT_LEAST = 1 << 20;
 
-/* The offset of an out-of-line value that leads to no such value; nothing if it does, or leads nowhere. */
+/* The offset of an out-of-line value, if no such value is stored there; nothing for a value that is in its place or
+ * is none. */
 std::optional<std::uint32_t> misplaced(const cdb::value &value, const cdb::bytes &strings) {
     constexpr std::size_t ALIGNMENT = 8;
     std::optional<std::uint32_t> place = value.place();
@@ -39,21 +40,21 @@ std::string text_of_handle(const vx_resource_handle_t &handle) {
 
 } // namespace
 
-teller::teller(std::size_t file_size) : left(file_size * TIMES_FILE + AT_LEAST) {}
+value_writer::value_writer(std::size_t file_size) : left(file_size * TIMES_FILE + AT_LEAST) {}
 
-void teller::spend(std::size_t amount) {
+void value_writer::spend(std::size_t amount) {
     if (amount > left)
         throw too_entangled("values or texts that lead to the same place too often");
     left -= amount;
 }
 
-std::string teller::text_of(std::string_view text) {
+std::string value_writer::text_of(std::string_view text) {
     spend(text.size());
     return text::quoted_ascii(text);
 }
 
 /* The elements of structured data have types of their own. */
-std::string teller::text_of_elements(const cdb::value &value, const cdb::bytes &strings) {
+std::string value_writer::text_of_elements(const cdb::value &value, const cdb::bytes &strings) {
     bool structured = value.type() == VX_SD_PTR;
     std::string text;
     for (const cdb::value &element : value.elements()) {
@@ -65,7 +66,7 @@ std::string teller::text_of_elements(const cdb::value &value, const cdb::bytes &
     return (structured ? "{" : "[") + text + (structured ? "}" : "]");
 }
 
-std::string teller::text_of(const cdb::value &value, const cdb::bytes &strings) {
+std::string value_writer::text_of(const cdb::value &value, const cdb::bytes &strings) {
     spend(1);
     if (std::optional<std::uint32_t> offset = misplaced(value, strings))
         return "misplaced " + std::to_string(*offset);
@@ -95,8 +96,8 @@ std::string teller::text_of(const cdb::value &value, const cdb::bytes &strings) 
 }
 
 /* What is not the attribute's own is a number of another type. */
-std::string teller::text_of_bound(const cdb::value &bound, bool is_own, const cdb::bytes &strings,
-                                  const cdb::ownership &owners) {
+std::string value_writer::text_of_bound(const cdb::value &bound, bool is_own, const cdb::bytes &strings,
+                                        const cdb::ownership &owners) {
     if (!is_own && bound.place())
         return "misplaced " + std::to_string(*bound.place());
     if (!cdb::is_array(bound.type()) || !bound.present())
@@ -111,4 +112,4 @@ std::string teller::text_of_bound(const cdb::value &bound, bool is_own, const cd
     return "[" + text + "]";
 }
 
-} // namespace cdef
+} // namespace compare

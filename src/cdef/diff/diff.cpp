@@ -5,6 +5,7 @@
 #include "cdef/support/output.h"
 #include "cdef/support/trouble.h"
 #include "compare/compare.h"
+#include "compare/text.h"
 #include "report/json_text.h"
 
 #include <CLI/CLI.hpp>
@@ -16,6 +17,10 @@ namespace cdef {
 
 namespace {
 
+using compare::change;
+using compare::difference;
+using compare::node;
+using compare::node_kind;
 using json = nlohmann::ordered_json;
 
 struct diff_options {
@@ -33,24 +38,25 @@ char sign_of(change what) {
     return what == change::removed ? '-' : what == change::added ? '+' : '~';
 }
 
-bool has_one_class(const thing &database) {
+bool has_one_class(const node &database) {
     return std::count_if(database.parts.begin(), database.parts.end(),
-                         [](const thing &t) { return t.kind == "ResourceClass"; }) == 1;
+                         [](const node &n) { return n.kind == node_kind::resource_class; }) == 1;
 }
 
-/* What of a path has to be said: not that the thing is in the database, nor that it is in the only class. */
-std::vector<const thing *> told_of(const difference &d, bool one_class) {
-    std::size_t skipped = d.path.size() == 1                                                     ? 0
-                          : d.path.size() > 2 && one_class && d.path[1]->kind == "ResourceClass" ? 2
-                                                                                                 : 1;
+/* The part of a path that a line shows: neither the database nor, if there is just one, the class. */
+std::vector<const node *> shown_path(const difference &d, bool one_class) {
+    std::size_t skipped = d.path.size() == 1                                                               ? 0
+                          : d.path.size() > 2 && one_class && d.path[1]->kind == node_kind::resource_class ? 2
+                                                                                                           : 1;
     return {d.path.begin() + static_cast<std::ptrdiff_t>(skipped), d.path.end()};
 }
 
 std::string line_of(const difference &d, bool one_class, bool with_reason) {
     std::string line = {sign_of(d.what), ' '};
     bool first = true;
-    for (const thing *t : told_of(d, one_class)) {
-        line += (std::exchange(first, false) ? "" : ", ") + t->kind + (t->name.empty() ? "" : " ") + t->name;
+    for (const node *n : shown_path(d, one_class)) {
+        line += std::exchange(first, false) ? "" : ", ";
+        line.append(n->label()).append(n->name.empty() ? "" : " ").append(n->name);
     }
     if (d.what == change::changed)
         line += ": " + std::string(d.before->what->label()) + " " + d.before->text + " -> " + d.after->text;
@@ -63,10 +69,10 @@ json json_of(const difference &d) {
     json data;
     data["change"] = name_of(d.what);
     data["path"] = json::array();
-    for (const thing *t : std::span(d.path).subspan(1)) { /* the first is the database */
+    for (const node *n : std::span(d.path).subspan(1)) { /* the first is the database */
         json entry;
-        entry["kind"] = t->kind;
-        entry["name"] = t->name;
+        entry["kind"] = n->label();
+        entry["name"] = n->name;
         data["path"].push_back(std::move(entry));
     }
     if (d.what == change::changed) {
@@ -79,13 +85,13 @@ json json_of(const difference &d) {
     return data;
 }
 
-thing read(const std::string &path, std::unique_ptr<input> &in) {
+node read(const std::string &path, std::unique_ptr<input> &in) {
     in = std::make_unique<input>(path);
     cdb::ownership owners(in->db, require_readable_aloud(*in));
     try {
-        return meaning_of(in->db, owners);
-    } catch (const too_entangled &t) {
-        throw trouble(path + ": " + t.what());
+        return compare::meaning_of(in->db, owners);
+    } catch (const compare::too_entangled &e) {
+        throw trouble(path + ": " + e.what());
     }
 }
 
@@ -93,9 +99,9 @@ int diff(const diff_options &options) {
     if (options.before == "-" && options.after == "-")
         throw trouble("only one of the two can be standard input");
     std::unique_ptr<input> in_before, in_after;
-    thing before = read(options.before, in_before);
-    thing after = read(options.after, in_after);
-    std::vector<difference> found = differences(before, after);
+    node before = read(options.before, in_before);
+    node after = read(options.after, in_after);
+    std::vector<difference> found = compare::differences(before, after);
     if (options.compat)
         std::erase_if(found, [](const difference &d) { return breach(d).empty(); });
     bool one_class = has_one_class(before) && has_one_class(after);

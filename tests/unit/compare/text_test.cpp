@@ -1,4 +1,4 @@
-#include "compare/compare.h"
+#include "compare/text.h"
 
 #include <gtest/gtest.h>
 
@@ -15,7 +15,7 @@ struct cell {
     std::string text_of(vx_data_type_t type) {
         cdb::bytes text_area(strings, std::endian::native);
         cdb::value value({stored, std::endian::native}, 0, type, text_area);
-        return cdef::teller(100).text_of(value, text_area);
+        return compare::value_writer(100).text_of(value, text_area);
     }
 
     std::array<std::byte, 8> stored = {};
@@ -33,9 +33,9 @@ TEST(compare_text, values_as_a_person_reads_them) {
 }
 
 TEST(compare_text, a_limit_keeps_texts_from_filling_the_memory) {
-    cdef::teller tell(0);
+    compare::value_writer writer(0);
     std::string half(1 << 19, 'x');
-    EXPECT_EQ(tell.text_of(half).size(), half.size() + 2);
-    EXPECT_EQ(tell.text_of(half).size(), half.size() + 2);
-    EXPECT_THROW(tell.text_of("x"), cdef::too_entangled);
+    EXPECT_EQ(writer.text_of(half).size(), half.size() + 2);
+    EXPECT_EQ(writer.text_of(half).size(), half.size() + 2);
+    EXPECT_THROW(writer.text_of("x"), compare::too_entangled);
 }

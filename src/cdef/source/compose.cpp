@@ -5,12 +5,13 @@
 #include "cdef/source/check.h"
 #include "cdef/source/error.h"
 #include "cdef/source/groups.h"
+#include "cdef/source/lines.h"
 #include "cdef/source/order.h"
 #include "cdef/source/range.h"
 #include "cdef/source/stanza.h"
+#include "cdef/source/structure.h"
 #include "cdef/source/text.h"
 #include "format/names.h"
-#include "text/append.h"
 #include "text/shown.h"
 
 #include <unordered_set>
@@ -63,86 +64,143 @@ void require_default_name(const cdb::resource_class &c, std::optional<std::strin
     output = c.name();
 }
 
-void write_permissions(source_writer &out, std::string_view name, std::uint32_t bits, const std::string &place) {
-    if (bits != 0 && bits != PERMISSIONS_GIVEN)
-        no_source(place, "no line sets " + std::string(name));
-    if (bits != 0)
-        out.line(name, 0);
-}
-
-void write_class_properties(source_writer &out, const rsrc_class_t &rc, const std::string &place) {
-    std::string names;
-    std::uint32_t bits = rc.rc_props;
-    for (const props_t &p : rc_props) {
-        if ((bits & p.p) == 0)
-            continue;
-        names.append(names.empty() ? "" : ",").append(p.s);
-        bits &= ~p.p;
+class resource_class_writer {
+public:
+    resource_class_writer(source_writer &to, const class_plan &of)
+        : out(to), from({.record = bytes_of(of.view.record()),
+                         .strings = of.view.side_tables().strings,
+                         .place = place_of("ResourceClass", of.view.name())}),
+          plan(of), rc(of.view.record()) {
+        if (!has_all_required(rc))
+            from.no_optional_lines = "optional lines, but no permission templates";
     }
-    if (bits != 0)
-        no_source(place, "no property has bit " + std::to_string(bits));
-    if (!names.empty() || has_all_required(rc))
-        out.line("Properties", names.empty() ? std::string_view(",") : names);
-}
 
-void write_resource_class(source_writer &out, const class_plan &plan) {
-    const rsrc_class_t &rc = plan.view.record();
-    std::string place = place_of("ResourceClass", plan.view.name());
-    out.blank_line();
-    out.stanza("ResourceClass", place);
-    out.line("Description", rc.rc_dscr_msgid);
-    out.line("DisplayName", rc.rc_disp_msgid);
-    write_class_properties(out, rc, place);
-    write_permissions(out, "ClassPermTemplate", rc.rc_perm_tempC, place);
-    write_permissions(out, "ResourcePermTemplate", rc.rc_perm_temp, place);
-    if (can_be_named(plan.view))
-        out.line("Name", plan.view.name());
-    std::uint16_t none = plan.is_last ? NO_LOCATOR : 0; /* a locator is looked up in the last class only */
-    if (rc.rc_locator == none)
-        return;
-    if (!plan.is_last || !has_all_required(rc))
-        no_source(place, "no line sets its locator");
-    out.line("Locator", locator_name(plan.view));
-}
+    void write() {
+        out.blank_line();
+        out.stanza("ResourceClass", from.place);
+        write_lines(*this, lines_of(SC_RESOURCE_CLASS));
+    }
+
+    static constexpr auto own_lines() {
+        using w = resource_class_writer;
+        return std::to_array<own_line<w>>({{offsetof(rsrc_class_t, rc_props), &w::write_properties},
+                                           {offsetof(rsrc_class_t, rc_perm_tempC), &w::write_class_template},
+                                           {offsetof(rsrc_class_t, rc_perm_temp), &w::write_resource_template},
+                                           {offsetof(rsrc_class_t, u_rc_name), &w::write_name},
+                                           {offsetof(rsrc_class_t, rc_locator), &w::write_locator}});
+    }
+
+    source_writer &out;
+    stanza_record from;
+
+private:
+    /* A required line: without a property it has a value that names none. */
+    void write_properties() {
+        std::string names = properties_text(rc.rc_props, rc_props, from.place);
+        if (!names.empty() || has_all_required(rc))
+            out.line("Properties", names.empty() ? std::string_view(",") : names);
+    }
+
+    void write_template(std::string_view name, std::uint32_t bits) {
+        if (bits != 0 && bits != PERMISSIONS_GIVEN)
+            no_source(from.place, "no line sets " + std::string(name));
+        if (bits != 0)
+            out.line(name, 0);
+    }
+    void write_class_template() {
+        write_template("ClassPermTemplate", rc.rc_perm_tempC);
+    }
+    void write_resource_template() {
+        write_template("ResourcePermTemplate", rc.rc_perm_temp);
+    }
+
+    void write_name() {
+        if (can_be_named(plan.view))
+            out.line("Name", plan.view.name());
+    }
+
+    void write_locator() {
+        std::uint16_t none = plan.is_last ? NO_LOCATOR : 0; /* a locator is looked up in the last class only */
+        if (rc.rc_locator == none)
+            return;
+        if (!plan.is_last || !has_all_required(rc))
+            no_source(from.place, "no line sets its locator");
+        out.line("Locator", locator_name(plan.view));
+    }
+
+    const class_plan &plan;
+    const rsrc_class_t &rc;
+};
+
+/* A stanza whose lines are all plain. */
+struct plain_stanza_writer {
+    static constexpr std::array<own_line<plain_stanza_writer>, 0> own_lines() {
+        return {};
+    }
+
+    void write(stanza_id stanza) {
+        out.blank_line();
+        out.stanza(sc_tables[stanza].sc_name, from.place);
+        write_lines(*this, lines_of(stanza));
+    }
+
+    source_writer &out;
+    stanza_record from;
+};
 
 void write_control_definition(source_writer &out, const cdb::resource_class &c) {
-    std::uint32_t version = c.record().rc_version;
-    std::string text;
-    text::appendf(text, "%u.%u.%u.%u", version >> 24, version >> 16 & 255, version >> 8 & 255, version & 255);
-    out.blank_line();
-    out.stanza("ControlDefinition", place_of("ResourceClass", c.name()));
-    out.line("FileVersion", text);
+    std::string place = place_of("ResourceClass", c.name());
+    plain_stanza_writer{out, {.record = bytes_of(c.record()), .strings = c.side_tables().strings, .place = place}}
+        .write(SC_CONTROL_DEFINITION);
 }
 
 /* ---- The other sections ---------------------------------------------------------------------------------------- */
 
 void write_variable_class(source_writer &out, const cdb::variable_class &v) {
-    out.blank_line();
-    out.stanza("ResourceVariableClass", place_of("ResourceVariableClass", v.name()));
-    if (!v.name().empty())
-        out.line("VariableClass", v.name());
-    out.line("ObservationInterval", v.record().rvc_obsv_interval);
-    out.line("ReportingInterval", v.record().rvc_report_interval);
-    if (v.alias().empty())
-        return;
+    stanza_record from = {.record = bytes_of(v.record()),
+                          .strings = v.strings(),
+                          .place = place_of("ResourceVariableClass", v.name()),
+                          .may_lack_texts = true};
     if (v.name().empty())
-        no_source("ResourceVariableClass ''", "an alias of a variable class without a name");
-    out.line("Alias", v.alias());
+        from.no_optional_lines = "an alias of a variable class without a name";
+    plain_stanza_writer{out, from}.write(SC_RESOURCE_VARIABLE_CLASS);
 }
+
+class map_writer {
+public:
+    map_writer(source_writer &to, const cdb::database &database, const cdb::class_map &map)
+        : out(to), from({.record = bytes_of(map.record()),
+                         .strings = map.strings(),
+                         .place = "ClassToManagerMapping",
+                         .may_lack_texts = true}),
+          db(database) {}
+
+    void write() {
+        out.blank_line();
+        out.stanza("ClassToManagerMapping", from.place);
+        write_lines(*this, lines_of(SC_CLASS_TO_MANAGER_MAPPING));
+    }
+
+    static constexpr auto own_lines() {
+        return std::to_array<own_line<map_writer>>({{offsetof(rsrc_cmmap_t, rcm_rm_ID), &map_writer::write_manager}});
+    }
+
+    source_writer &out;
+    stanza_record from;
+
+private:
+    void write_manager() {
+        out.line("ResourceManager", (*db.managers().begin()).name());
+    }
+
+    const cdb::database &db;
+};
 
 void write_map(source_writer &out, const cdb::database &db) {
     cdb::class_map map = *db.maps().begin();
-    const rsrc_cmmap_t &r = map.record();
-    if (r.rcm_first_key > r.rcm_last_key)
+    if (map.record().rcm_first_key > map.record().rcm_last_key)
         no_source("ClassToManagerMapping", "its first key is above its last");
-    out.blank_line();
-    out.stanza("ClassToManagerMapping", "ClassToManagerMapping");
-    out.line("ResourceManager", (*db.managers().begin()).name());
-    out.line("FirstKey", r.rcm_first_key);
-    out.line("LastKey", r.rcm_last_key);
-    if (!map.message_catalog().empty())
-        out.line("MessageCatalog", map.message_catalog());
-    out.line("DescriptiveMessageSet", r.rcm_dscr_msg_set);
+    map_writer(out, db, map).write();
 }
 
 /* ---- The whole ------------------------------------------------------------------------------------------------- */
@@ -182,6 +240,14 @@ void write_heading(source_writer &out, const std::vector<class_plan> &plans) {
 
 } // namespace
 
+std::vector<std::size_t> own_fields(stanza_id stanza) {
+    if (stanza == SC_RESOURCE_CLASS)
+        return own_fields_of<resource_class_writer>();
+    if (stanza == SC_CLASS_TO_MANAGER_MAPPING)
+        return own_fields_of<map_writer>();
+    return sc_tables[stanza].sc_record == STAGED_SD_DEF ? own_element_fields() : own_attribute_fields(stanza);
+}
+
 std::string source_of(const cdb::database &db, const cdb::ownership &owners) {
     require_settable(db);
     std::vector<class_plan> plans = plans_of(db, owners);
@@ -190,7 +256,7 @@ std::string source_of(const cdb::database &db, const cdb::ownership &owners) {
     write_heading(out, plans);
     for (const class_plan &plan : plans) {
         write_control_definition(out, plan.view);
-        write_resource_class(out, plan);
+        resource_class_writer(out, plan).write();
         if (&plan == &plans.front())
             for (const cdb::variable_class &v : db.variable_classes())
                 write_variable_class(out, v);

@@ -4,6 +4,7 @@
 
 #include "cdb_view.h"
 #include "format/sections.h"
+#include "language/catalogue.h"
 #include "reader/ownership.h"
 
 #include <array>
@@ -36,6 +37,17 @@ static_assert(side_table_of(table::persistent_attributes).stanza == "PersistentR
 static_assert(side_table_of(table::dynamic_attributes).stanza == "DynamicResourceAttribute");
 static_assert(side_table_of(table::class_actions).stanza == "ClassAction");
 static_assert(side_table_of(table::actions).stanza == "ResourceAction");
+
+/* table: not inputs */
+constexpr stanza_id stanza_of(table t) {
+    constexpr std::array<stanza_id, RECORD_TABLES> stanzas = {SC_PERSISTENT_CLASS_ATTRIBUTE,
+                                                              SC_DYNAMIC_CLASS_ATTRIBUTE,
+                                                              SC_PERSISTENT_RESOURCE_ATTRIBUTE,
+                                                              SC_DYNAMIC_RESOURCE_ATTRIBUTE,
+                                                              SC_CLASS_ACTION,
+                                                              SC_RESOURCE_ACTION};
+    return stanzas[static_cast<std::size_t>(t)];
+}
 
 constexpr cdb::level level_of(table t) {
     return t == table::persistent_class_attributes || t == table::dynamic_class_attributes || t == table::class_actions

@@ -3,6 +3,7 @@
 #include "cdef/source/structure.h"
 
 #include "cdef/source/error.h"
+#include "cdef/source/lines.h"
 #include "cdef/source/lists.h"
 #include "cdef/source/runs.h"
 #include "text/shown.h"
@@ -27,34 +28,65 @@ void require_types(const cdb::sd_definition &definition, bool makes_value, const
     }
 }
 
-struct run_line {
-    std::string_view name;
-    vx_data_type_t type;
-    std::uint16_t description;
-    std::uint16_t display_name;
-};
+/* The stanza of one element. */
+class element_writer {
+public:
+    /* index: of ElementIndex; nothing: no such line. */
+    element_writer(source_writer &to, std::string_view name, const sd_field_t &record,
+                   const cdb::valid_value_list &valid_values, std::optional<std::size_t> index)
+        : out(to), from({.record = bytes_of(record), .strings = {}, .place = {}}), element_name(name),
+          type(record.sd_field_type), values(valid_values), element_index(index) {}
 
-void write_element(source_writer &out, std::string_view stanza, const run_line &e, std::optional<std::size_t> index,
-                   const std::string &place) {
-    out.stanza(stanza, place + ", element " + text::quoted_ascii(e.name));
-    out.line("ElementName", e.name);
-    out.line("Description", e.description);
-    out.line("DisplayName", e.display_name);
-    if (index)
-        out.line("ElementIndex", static_cast<std::int64_t>(*index));
-    out.line("DataType", cdb::name_of(e.type));
-}
+    /* place: of the run. */
+    void write(std::string_view stanza, const std::string &place) {
+        from.place = place + ", element " + text::quoted_ascii(element_name);
+        out.stanza(stanza, from.place);
+        write_lines(*this, lines_of(SC_PATTR_SD_DEFINITION)); /* all kinds of elements have the same lines */
+    }
+
+    static constexpr auto own_lines() {
+        using w = element_writer;
+        return std::to_array<own_line<w>>({{offsetof(sd_field_t, u_sd_field_name), &w::write_name},
+                                           {offsetof(sd_field_t, sd_field_type), &w::write_type},
+                                           {offsetof(sd_field_t, u_sd_valid_vals), &w::write_values},
+                                           {offsetof(sd_field_t, sd_reserved), &w::write_index}});
+    }
+
+    source_writer &out;
+    stanza_record from;
+
+private:
+    void write_name() {
+        out.line("ElementName", element_name);
+    }
+    void write_type() {
+        out.line("DataType", cdb::name_of(type));
+    }
+    void write_values() {
+        write_valid_values(out, "ValidValue", values);
+    }
+    /* The compiler checks the index and stores nothing. */
+    void write_index() {
+        if (element_index)
+            out.line("ElementIndex", static_cast<std::int64_t>(*element_index));
+    }
+
+    std::string_view element_name;
+    vx_data_type_t type;
+    const cdb::valid_value_list &values;
+    std::optional<std::size_t> element_index;
+};
 
 void write_indexed_run(source_writer &out, std::string_view stanza, const cdb::sd_definition &definition,
                        const std::vector<bool> &indexed, const std::string &place) {
     std::size_t index = 0;
     for (std::size_t i = 0; i < definition.size(); ++i) {
         cdb::sd_element e = definition[i];
-        if (stanza == "ActionOutSDDefinition" && !e.valid_values().empty())
+        cdb::valid_value_list values = e.valid_values();
+        if (stanza == "ActionOutSDDefinition" && !values.empty())
             no_source(place, "an element of a response has no valid values");
-        write_element(out, stanza, {e.name(), e.type(), e.record().sd_dscr_msgid, e.record().sd_disp_msgid},
-                      indexed[i] ? std::optional(index++) : std::nullopt, place);
-        write_valid_values(out, "ValidValue", e.valid_values());
+        std::optional<std::size_t> given = indexed[i] ? std::optional(index++) : std::nullopt;
+        element_writer(out, e.name(), e.record(), values, given).write(stanza, place);
     }
 }
 
@@ -62,9 +94,12 @@ void write_indexed_run(source_writer &out, std::string_view stanza, const cdb::s
 void write_replaced_run(source_writer &out, const attribute_structure &s, const element_types &value, std::size_t given,
                         const std::string &place) {
     out.comment("The next run replaces this one, but for the value.");
-    for (std::size_t i = 0; i < value.types.size(); ++i)
-        write_element(out, s.other_stanza, {"Replaced", value.types[i], 0, 0},
-                      i < given ? std::optional(i) : std::nullopt, place);
+    for (std::size_t i = 0; i < value.types.size(); ++i) {
+        sd_field_t element = {};
+        element.sd_field_type = value.types[i];
+        std::optional<std::size_t> index = i < given ? std::optional(i) : std::nullopt;
+        element_writer(out, "Replaced", element, {}, index).write(s.other_stanza, place);
+    }
 }
 
 std::size_t require_indices(std::size_t elements, std::uint16_t highest, const std::string &place) {
@@ -95,6 +130,10 @@ void write_late_run(source_writer &out, const attribute_structure &s, const elem
 }
 
 } // namespace
+
+std::vector<std::size_t> own_element_fields() {
+    return own_fields_of<element_writer>();
+}
 
 void write_run(source_writer &out, std::string_view stanza, const cdb::sd_definition &definition,
                const std::string &place) {

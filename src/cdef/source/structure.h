@@ -24,6 +24,9 @@ void write_structure(source_writer &out, const attribute_structure &s, const std
 void write_run(source_writer &out, std::string_view stanza, const cdb::sd_definition &definition,
                const std::string &place);
 
+/* Offsets of the fields whose lines an element's stanza writes in a way of its own. */
+std::vector<std::size_t> own_element_fields();
+
 } // namespace cdef::source
 
 #endif

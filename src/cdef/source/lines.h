@@ -1,0 +1,97 @@
+/* lines.h: the lines of a stanza, from the catalogue's attributes and the facts of the fields that they fill. An
+ * attribute whose line reads as its field does is written without further ado: a new one needs nothing here. */
+#ifndef CDGEN_CDEF_SOURCE_LINES_H
+#define CDGEN_CDEF_SOURCE_LINES_H
+
+#include "cdb_view.h"
+#include "cdef/source/writer.h"
+#include "format/records.h"
+#include "language/catalogue.h"
+
+#include <optional>
+
+namespace cdef::source {
+
+/* An attribute of a stanza, and the field that it names. */
+struct stanza_line {
+    const table_attrs *attribute;
+    const cdb::field *field;
+    const cdb::field_fact *fact;
+
+    bool is_required() const {
+        return (attribute->req_bit & OPTIONAL) == 0;
+    }
+};
+
+/* In the order in which a stanza has them: required ones first, since the compiler takes no optional one before it has
+ * them all. format: of the record that the stanza fills. start: its offset in the staged record. */
+std::vector<stanza_line> lines_of(std::span<const table_attrs> attributes, const cdb::record_format &format,
+                                  std::size_t start = 0);
+/* Those of a stanza in the catalogue. */
+const std::vector<stanza_line> &lines_of(stanza_id stanza);
+
+/* Whether the line is a number, a text, or a word that stands for a number, as in the field. Any other line needs a
+ * writer of its own. */
+bool is_plain(const stanza_line &line);
+
+/* The record that a stanza is written from. */
+struct stanza_record {
+    cdb::bytes record; /* in the byte order of this machine */
+    cdb::bytes strings;
+    std::string place;                  /* for messages */
+    bool is_completed = true;           /* the compiler gave defaults to fields that no line fills */
+    bool may_lack_texts = false;        /* a required text may be missing */
+    std::string no_optional_lines = {}; /* why no optional line can follow; empty: they can */
+};
+
+template <class Record> cdb::bytes bytes_of(const Record &record) {
+    return {std::as_bytes(std::span(&record, 1)), std::endian::native};
+}
+
+/* Whether the field is what the compiler makes of it without the line. The line is plain. */
+bool is_default(const stanza_line &line, const stanza_record &from);
+
+/* The value of a plain line; nothing if the stanza needs no such line. Throws no_source_error if it needs one, but no
+ * line gives the field its value. */
+std::optional<std::string> plain_text(const stanza_line &line, const stanza_record &from);
+
+/* The names of the bits, as a line of properties has them. Throws no_source_error for a bit without a name. */
+std::string properties_text(std::uint32_t bits, std::span<const props_t> known, const std::string &place);
+
+/* A field whose lines are written in a way of their own. */
+template <class Writer> struct own_line {
+    std::size_t offset; /* of the field in the record */
+    void (Writer::*write)();
+};
+
+/* Writes a line that no writer of its own writes. */
+void write_plain_line(source_writer &out, const stanza_line &line, const stanza_record &from);
+
+/* Writes lines in their order. Writer has out, from and own_lines(). One function that writes the lines of several
+ * fields is called once, for the first of them. */
+template <class Writer> void write_lines(Writer &writer, std::span<const stanza_line> lines) {
+    constexpr auto own = Writer::own_lines();
+    std::vector<void (Writer::*)()> done;
+    for (const stanza_line &line : lines) {
+        auto found = std::find_if(own.begin(), own.end(),
+                                  [&](const own_line<Writer> &o) { return o.offset == line.field->offset; });
+        if (found == own.end()) {
+            write_plain_line(writer.out, line, writer.from);
+        } else if (std::find(done.begin(), done.end(), found->write) == done.end()) {
+            (writer.*found->write)();
+            done.push_back(found->write);
+        }
+    }
+}
+
+/* The offsets of the fields that have own lines. */
+template <class Writer> std::vector<std::size_t> own_fields_of() {
+    std::vector<std::size_t> offsets;
+    for (const own_line<Writer> &own : Writer::own_lines())
+        offsets.push_back(own.offset);
+    return offsets;
+}
+
+} // namespace cdef::source
+
+#endif

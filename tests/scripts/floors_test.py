@@ -1,0 +1,75 @@
+"""The libraries of src/ rest only on those below them; and script/floors, which sees to that, finds what breaks it."""
+
+import importlib.machinery
+import importlib.util
+import subprocess
+import sys
+
+import pytest
+from programs import PROGRAMS, PROJECT
+
+SCRIPT = PROJECT / "script/floors"
+
+
+@pytest.fixture(scope="module")
+def floors():
+    """The script as a module."""
+    loader = importlib.machinery.SourceFileLoader("floors", str(SCRIPT))
+    module = importlib.util.module_from_spec(importlib.util.spec_from_loader("floors", loader))
+    loader.exec_module(module)
+    return module
+
+
+def library(directory, folder, **sources):
+    """A static library as a build has it: in src/FOLDER, its object files beside it."""
+    place = directory / "src" / folder
+    objects = place / "CMakeFiles" / f"{folder}.dir"
+    objects.mkdir(parents=True)
+    for name, text in sources.items():
+        (objects / f"{name}.cpp").write_text(text)
+        subprocess.run(["c++", "-c", "-o", objects / f"{name}.cpp.o", objects / f"{name}.cpp"], check=True)
+    made = place / f"lib{folder}.a"
+    subprocess.run(["ar", "rc", made, *objects.glob("*.o")], check=True)
+    return made
+
+
+def test_house_stands():
+    if PROGRAMS.sanitizers:
+        pytest.skip("everything needs the sanitizer's library there")
+    run = subprocess.run([sys.executable, "-B", SCRIPT, PROGRAMS.build], capture_output=True, text=True, check=False)
+    assert (run.returncode, run.stdout, run.stderr) == (0, "", "")
+
+
+def test_circle_is_found(floors):
+    arrows = {"a": {"b"}, "b": {"c"}, "c": {"a"}, "alone": {"a"}}
+    assert floors.circles_in(arrows) == [["a", "b", "c"]]
+
+
+def test_chain_is_no_circle(floors):
+    assert floors.circles_in({"a": {"b"}, "b": {"c"}, "c": set()}) == []
+
+
+def test_arrows_follow_symbols(floors, directory):
+    made = library(directory, "low", up="int down(); int up() { return down(); }", down="int down() { return 1; }")
+    assert floors.arrows_of(made) == {"up.cpp": {"down.cpp"}, "down.cpp": set()}
+
+
+def test_missing_symbol_is_found(floors, directory):
+    made = library(directory, "low", user="int upstairs(); int low() { return upstairs(); }")
+    problems = floors.link_problems(directory, "low", [], {"low": made})
+    assert problems == ["low/ needs upstairs(), which no floor below it has"]
+
+
+def test_symbol_of_a_lower_floor_is_found(floors, directory):
+    low = library(directory, "low", low="int low() { return 1; }")
+    high = library(directory, "high", high="int low(); int high() { return low(); }")
+    assert floors.link_problems(directory, "high", ["low"], {"low": low, "high": high}) == []
+
+
+def test_include_of_a_higher_floor_is_found(floors, monkeypatch, directory):
+    (directory / "src/text").mkdir(parents=True)
+    (directory / "src/text/low.h").write_text('#include "cdef/high.h"\n#include "text/other.h"\n')
+    monkeypatch.setattr(floors, "ROOT", directory)
+    assert list(floors.wrong_includes("text", [])) == [
+        "src/text/low.h includes cdef/, which is no floor below text/"
+    ]

@@ -1,7 +1,7 @@
 /* cdef.cpp: the command line of cdef, which shows what is in a class definition database. */
 
 #include "cdef/cdef.h"
-#include "cdef/support/trouble.h"
+#include "cdef/support/failure.h"
 #include "text/shown.h"
 
 #include <CLI/CLI.hpp>
@@ -73,10 +73,10 @@ int run(int argc, char **argv) {
     } catch (const CLI::Success &help) {
         app.exit(help);
         std::cout.flush();
-        return std::cout ? OK : throw trouble("standard output: cannot write");
+        return std::cout ? OK : throw failure("standard output: cannot write");
     } catch (const CLI::ParseError &usage) {
         app.exit(usage);
-        return TROUBLE;
+        return FAILED;
     }
     return status;
 }
@@ -86,10 +86,10 @@ int run(int argc, char **argv) {
 int cdef_main(int argc, char **argv) {
     try {
         return run(argc, argv);
-    } catch (const std::exception &trouble) {
-        tell(trouble.what());
+    } catch (const std::exception &e) {
+        print_error(e.what());
     }
-    return TROUBLE;
+    return FAILED;
 }
 
 } // namespace cdef

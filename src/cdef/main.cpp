@@ -1,7 +1,7 @@
 /* main.cpp: the program's entry; everything else is a library that a fuzzer links too. */
 
 #include "cdef/cdef.h"
-#include "cdef/support/trouble.h"
+#include "cdef/support/failure.h"
 
 #include <cstdio>
 #include <cstdlib>
@@ -12,7 +12,7 @@ namespace {
 /* No exception: JSON values are destroyed on its way, and that takes memory too. */
 [[noreturn]] void end_without_memory() {
     std::fputs("cdef: out of memory\n", stderr);
-    std::exit(cdef::TROUBLE);
+    std::exit(cdef::FAILED);
 }
 
 } // namespace

@@ -7,7 +7,7 @@
  * the subcommands say of the same file goes together. */
 
 #include "cdef/cdef.h"
-#include "cdef/support/trouble.h"
+#include "cdef/support/failure.h"
 #include "compiler/cdgen.h"
 #include "fuzz.h"
 
@@ -247,8 +247,7 @@ void look_at_hex(const outcome &came, const bytes &image, const words & /*form*/
 /* Where the source says itself that its output needs a certain name, it is not compiled. */
 void look_at_source(const outcome &came, const bytes &image, const words & /*form*/) {
     bool refused = came.err.find(": no source: ") != std::string::npos;
-    fuzz::require(came.status == (judge(image).readable && !refused ? cdef::OK : cdef::TROUBLE),
-                  "no source, no reason");
+    fuzz::require(came.status == (judge(image).readable && !refused ? cdef::OK : cdef::FAILED), "no source, no reason");
     fuzz::require(came.out.empty() == (came.status != cdef::OK), "half a source");
     if (came.status != cdef::OK || came.out.find("called after the output file") != std::string::npos)
         return;
@@ -265,9 +264,9 @@ void look_at_source(const outcome &came, const bytes &image, const words & /*for
 void look_at_diff(const outcome &came, const bytes &before, const bytes &after, const words &form) {
     bool readable = judge(before).readable && judge(after).readable;
     bool too_often = came.err.find("lead to the same place too often") != std::string::npos;
-    fuzz::require((came.status == cdef::TROUBLE) == (!readable || too_often), "another status");
+    fuzz::require((came.status == cdef::FAILED) == (!readable || too_often), "another status");
     fuzz::require(before != after || came.status != cdef::FOUND, "a file differs from itself");
-    if (came.status == cdef::TROUBLE) {
+    if (came.status == cdef::FAILED) {
         fuzz::require(came.out.empty(), "half a comparison");
         return;
     }
@@ -300,7 +299,7 @@ void look_at_check(const outcome &came, const bytes & /*source*/, const words &f
     auto has = [&](const char *word) { return std::find(form.begin(), form.end(), word) != form.end(); };
     outcome compiler = compiled(all_files().first);
     bool compiles = compiler.status == 0;
-    fuzz::require(came.status != cdef::TROUBLE, "a source cannot be checked");
+    fuzz::require(came.status != cdef::FAILED, "a source cannot be checked");
     if (has("--werror"))
         fuzz::require(came.err.empty() == (came.status == cdef::OK), "another status");
     else

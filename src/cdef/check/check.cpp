@@ -3,8 +3,8 @@
 #include "check/check.h"
 
 #include "cdef/cdef.h"
+#include "cdef/support/failure.h"
 #include "cdef/support/output.h"
-#include "cdef/support/trouble.h"
 #include "report/report.h"
 
 #include <CLI/CLI.hpp>
@@ -58,7 +58,7 @@ check::warning_set chosen(const check_options &options) {
 
 void show_text(const std::string &text) {
     if (std::fwrite(text.data(), 1, text.size(), stderr) != text.size())
-        throw trouble("standard error: cannot write");
+        throw failure("standard error: cannot write");
 }
 
 /* Checks a source and shows what is found in it. */
@@ -102,12 +102,12 @@ int check_all(const check_options &options) {
                 count = all.emplace_back(check_for_later(source, chosen(options))).count;
             pass = pass && count.errors == 0 && (count.warnings == 0 || !options.warnings_count);
         } catch (const check::cannot_check &unreadable) {
-            tell(unreadable.what());
+            print_error(unreadable.what());
             read = false;
         }
     }
     show(all, options.format);
-    return !read ? TROUBLE : pass ? OK : FOUND;
+    return !read ? FAILED : pass ? OK : FOUND;
 }
 
 } // namespace

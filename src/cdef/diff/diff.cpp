@@ -1,9 +1,9 @@
 /* diff.cpp: what differs between two databases, and whether readers of the one can read the other. */
 
 #include "cdef/cdef.h"
+#include "cdef/support/failure.h"
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
-#include "cdef/support/trouble.h"
 #include "compare/compare.h"
 #include "compare/text.h"
 #include "report/json_text.h"
@@ -91,13 +91,13 @@ node read(const std::string &path, std::unique_ptr<input> &in) {
     try {
         return compare::meaning_of(in->db, owners);
     } catch (const compare::too_entangled &e) {
-        throw trouble(path + ": " + e.what());
+        throw failure(path + ": " + e.what());
     }
 }
 
 int diff(const diff_options &options) {
     if (options.before == "-" && options.after == "-")
-        throw trouble("only one of the two can be standard input");
+        throw failure("only one of the two can be standard input");
     std::unique_ptr<input> in_before, in_after;
     node before = read(options.before, in_before);
     node after = read(options.after, in_after);

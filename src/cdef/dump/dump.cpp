@@ -2,7 +2,7 @@
 
 #include "cdef/dump/dump.h"
 #include "cdef/cdef.h"
-#include "cdef/support/trouble.h"
+#include "cdef/support/failure.h"
 
 #include <CLI/CLI.hpp>
 

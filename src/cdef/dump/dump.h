@@ -97,7 +97,7 @@ public:
     virtual void add(const label &what, const fact &f) = 0;
 };
 
-/* Each shows a whole database on standard output; throws trouble if that fails. */
+/* Each shows a whole database on standard output; throws failure if that fails. */
 void show_listing(const input &in, bool with_offsets);
 void show_json(const input &in, bool with_offsets);
 void show_hex(const input &in);

@@ -3,9 +3,9 @@
 #include "cdef/cdef.h"
 #include "cdef/source/compose.h"
 #include "cdef/source/error.h"
+#include "cdef/support/failure.h"
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
-#include "cdef/support/trouble.h"
 #include "text/shown.h"
 
 #include <CLI/CLI.hpp>
@@ -36,10 +36,10 @@ int run(const std::string &path) {
     try {
         text = source::source_of(in.db, owners);
     } catch (const source::no_source_error &e) {
-        throw trouble(path + ": " + e.what());
+        throw failure(path + ": " + e.what());
     }
     if (isatty(STDOUT_FILENO) != 0 && !is_harmless(text))
-        throw trouble(path + ": the source has characters that are not for terminals: write it to a file");
+        throw failure(path + ": the source has characters that are not for terminals: write it to a file");
     print(text);
     return OK;
 }

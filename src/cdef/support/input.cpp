@@ -2,7 +2,7 @@
 
 #include "cdef/support/input.h"
 
-#include "cdef/support/trouble.h"
+#include "cdef/support/failure.h"
 
 #include <algorithm>
 #include <array>
@@ -43,7 +43,7 @@ std::vector<std::byte> contents_of(const std::string &path) {
     std::error_code error;
     std::vector<std::byte> contents = path == "-" ? standard_input(error) : cdb::read_file(path.c_str(), error);
     if (error)
-        throw trouble(path + ": " + error.message());
+        throw failure(path + ": " + error.message());
     return contents;
 }
 
@@ -54,7 +54,7 @@ input::input(const std::string &path) : name(path), contents(contents_of(path)),
 std::vector<cdb::finding> require_readable(const input &in) {
     std::vector<cdb::finding> findings = cdb::verify(in.db);
     if (!std::all_of(findings.begin(), findings.end(), tolerable))
-        throw trouble(in.name + ": not a sound database; 'cdef verify' says why");
+        throw failure(in.name + ": not a sound database; 'cdef verify' says why");
     return findings;
 }
 
@@ -64,7 +64,7 @@ std::vector<cdb::finding> require_readable_aloud(const input &in) {
         auto found = std::find_if(findings.begin(), findings.end(),
                                   [code](const cdb::finding &f) { return f.broken->code == code; });
         if (found != findings.end())
-            tell(in.name + ": " + std::string(found->broken->title));
+            print_error(in.name + ": " + std::string(found->broken->title));
     }
     return findings;
 }

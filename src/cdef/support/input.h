@@ -11,7 +11,7 @@ namespace cdef {
 
 /* A database read from a file; "-" is standard input. */
 struct input {
-    /* Throws trouble when it cannot be read. */
+    /* Throws failure when it cannot be read. */
     explicit input(const std::string &path);
     input(const input &) = delete;
     input &operator=(const input &) = delete;
@@ -21,7 +21,7 @@ struct input {
     cdb::database db;
 };
 
-/* Throws trouble unless the database's records and values can be relied on: its only errors may be a wrong checksum
+/* Throws failure unless the database's records and values can be relied on: its only errors may be a wrong checksum
  * and filling that is not zero. Returns its findings. */
 std::vector<cdb::finding> require_readable(const input &in);
 

@@ -2,7 +2,7 @@
 
 #include "cdef/support/output.h"
 
-#include "cdef/support/trouble.h"
+#include "cdef/support/failure.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -14,7 +14,7 @@ namespace cdef {
 
 void print(const std::string &text) {
     if (std::fwrite(text.data(), 1, text.size(), stdout) != text.size() || std::fflush(stdout) != 0)
-        throw trouble(std::string("standard output: ") + std::strerror(errno));
+        throw failure(std::string("standard output: ") + std::strerror(errno));
 }
 
 bool wants_colour() {

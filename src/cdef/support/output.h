@@ -7,7 +7,7 @@
 
 namespace cdef {
 
-/* Writes to standard output; throws trouble if that fails. */
+/* Writes to standard output; throws failure if that fails. */
 void print(const std::string &text);
 
 /* True if terminal colours are wanted: standard output is a terminal, and NO_COLOR is not set or empty. */

@@ -1,9 +1,9 @@
 /* verify.cpp: the subcommand that checks whether databases are sound. */
 
 #include "cdef/cdef.h"
+#include "cdef/support/failure.h"
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
-#include "cdef/support/trouble.h"
 #include "cdef/verify/findings.h"
 #include "report/json_text.h"
 
@@ -63,13 +63,13 @@ int run(const verify_options &options) {
             pass = pass && v.passes;
             text += v.text;
             all.push_back(std::move(v.data));
-        } catch (const trouble &unreadable) {
-            tell(unreadable.what());
+        } catch (const failure &unreadable) {
+            print_error(unreadable.what());
             read = false;
         }
     }
     print(options.as_json ? report::json_text(all) : text);
-    return !read ? TROUBLE : pass ? OK : FOUND;
+    return !read ? FAILED : pass ? OK : FOUND;
 }
 
 } // namespace

@@ -1,6 +1,6 @@
-/* trouble.cpp: messages on standard error. */
+/* failure.cpp: messages on standard error. */
 
-#include "cdef/support/trouble.h"
+#include "cdef/support/failure.h"
 
 #include "text/shown.h"
 
@@ -9,7 +9,7 @@
 namespace cdef {
 
 /* File names are part of messages, and a name may hold anything. */
-void tell(const std::string &message) {
+void print_error(const std::string &message) {
     std::fprintf(stderr, "cdef: %s\n", text::escaped(message).c_str());
 }
 

@@ -53,21 +53,18 @@ size_t strings_size(const cdb_ref_t &strings) {
     return round8(checked_size(used_bytes(strings)));
 }
 
-/* Errors, dependencies and structured byte strings are deliberately not counted. */
+/* Notes the counts and sizes of a class's tables in its record, and returns the size of its section. Errors,
+ * dependencies and structured byte strings are deliberately not counted. */
 size_t class_size(rsrc_class_t &rc) {
-    rc.rc_num_pattrsC = checked_count(rc.u_rc_pattrsC, sizeof(rsrc_pattr_t));
-    rc.rc_num_pattrs = checked_count(rc.u_rc_pattrs, sizeof(rsrc_pattr_t));
-    rc.rc_num_dattrsC = checked_count(rc.u_rc_dattrsC, sizeof(rsrc_dattr_t));
-    rc.rc_num_dattrs = checked_count(rc.u_rc_dattrs, sizeof(rsrc_dattr_t));
-    rc.rc_sd_size = checked_size(used_bytes(rc.u_rc_sd_defs));
-    rc.rc_num_actionsC = checked_count(rc.u_rc_actionsC, sizeof(rsrc_action_t));
-    rc.rc_num_actions = checked_count(rc.u_rc_actions, sizeof(rsrc_action_t));
-    rc.rc_varlist_size = checked_size(used_bytes(rc.u_rc_variety_lists));
-    rc.rc_valval_size = checked_size(used_bytes(rc.u_rc_valid_vals));
-    return sizeof rc + sizeof(rsrc_pattr_t) * (size_t{rc.rc_num_pattrs} + rc.rc_num_pattrsC) +
-           sizeof(rsrc_dattr_t) * (size_t{rc.rc_num_dattrs} + rc.rc_num_dattrsC) + rc.rc_sd_size +
-           sizeof(rsrc_action_t) * (size_t{rc.rc_num_actionsC} + rc.rc_num_actions) + rc.rc_varlist_size +
-           rc.rc_valval_size + strings_size(rc.u_rc_strings);
+    size_t size = sizeof rc;
+    for (const cdb::side_table &table : cdb::side_tables_as_counted) {
+        if (table.count != nullptr)
+            rc.*table.count = checked_count(rc.*table.ref, table.record->size);
+        else
+            rc.*table.bytes = checked_size(used_bytes(rc.*table.ref));
+        size += table.size_in(rc);
+    }
+    return size + strings_size(rc.u_rc_strings);
 }
 
 /* ---- The output file ------------------------------------------------------------------------------------------- */

@@ -62,6 +62,8 @@ enum class table_form : std::uint8_t {
     ROUNDED    /* recorded, and filled with zeros to a multiple of 8 */
 };
 
+inline constexpr int NOT_COUNTED = -1;
+
 struct side_table {
     cdb_ref_t rsrc_class_t::*ref;      /* its offset in the section */
     cdb_uint16_t rsrc_class_t::*count; /* of its records; null: not a table of records */
@@ -70,6 +72,8 @@ struct side_table {
     const char *trace_name;            /* as the compiler's traces call it */
     std::size_t growth;                /* bytes by which the compiler lets it grow */
     int made;                          /* its place in the order in which the compiler makes them */
+    int counted; /* its place in the order in which the compiler counts them, which decides which of two tables that are
+                    too large it names; NOT_COUNTED: the record does not say how large it is, or deliberately says 0 */
     table_form form = table_form::LOCATED;
     std::string_view key = {};    /* in JSON */
     std::string_view title = {};  /* of a record, in words */
@@ -84,33 +88,35 @@ struct side_table {
 /* In the order of the file. */
 inline constexpr side_table side_tables[] = {
     {&rsrc_class_t::u_rc_pattrsC, &rsrc_class_t::rc_num_pattrsC, nullptr, &format_for<rsrc_pattr_t>, "ClassPattrsC",
-     16 * sizeof(rsrc_pattr_t), 0, table_form::LOCATED, "persistent_class_attributes", "persistent class attribute",
+     16 * sizeof(rsrc_pattr_t), 0, 0, table_form::LOCATED, "persistent_class_attributes", "persistent class attribute",
      "PersistentClassAttribute"},
     {&rsrc_class_t::u_rc_dattrsC, &rsrc_class_t::rc_num_dattrsC, nullptr, &format_for<rsrc_dattr_t>, "ClassDattrsC",
-     16 * sizeof(rsrc_dattr_t), 1, table_form::LOCATED, "dynamic_class_attributes", "dynamic class attribute",
+     16 * sizeof(rsrc_dattr_t), 1, 2, table_form::LOCATED, "dynamic_class_attributes", "dynamic class attribute",
      "DynamicClassAttribute"},
     {&rsrc_class_t::u_rc_pattrs, &rsrc_class_t::rc_num_pattrs, nullptr, &format_for<rsrc_pattr_t>, "ClassPattrs",
-     16 * sizeof(rsrc_pattr_t), 2, table_form::LOCATED, "persistent_resource_attributes",
+     16 * sizeof(rsrc_pattr_t), 2, 1, table_form::LOCATED, "persistent_resource_attributes",
      "persistent resource attribute", "PersistentResourceAttribute"},
     {&rsrc_class_t::u_rc_dattrs, &rsrc_class_t::rc_num_dattrs, nullptr, &format_for<rsrc_dattr_t>, "ClassDattrs",
-     16 * sizeof(rsrc_dattr_t), 3, table_form::LOCATED, "dynamic_resource_attributes", "dynamic resource attribute",
+     16 * sizeof(rsrc_dattr_t), 3, 3, table_form::LOCATED, "dynamic_resource_attributes", "dynamic resource attribute",
      "DynamicResourceAttribute"},
     {&rsrc_class_t::u_rc_actionsC, &rsrc_class_t::rc_num_actionsC, nullptr, &format_for<rsrc_action_t>, "ClassActionsC",
-     4 * sizeof(rsrc_action_t), 4, table_form::LOCATED, "class_actions", "class action", "ClassAction"},
+     4 * sizeof(rsrc_action_t), 4, 5, table_form::LOCATED, "class_actions", "class action", "ClassAction"},
     {&rsrc_class_t::u_rc_actions, &rsrc_class_t::rc_num_actions, nullptr, &format_for<rsrc_action_t>, "ClassActions",
-     4 * sizeof(rsrc_action_t), 5, table_form::LOCATED, "resource_actions", "resource action", "ResourceAction"},
+     4 * sizeof(rsrc_action_t), 5, 6, table_form::LOCATED, "resource_actions", "resource action", "ResourceAction"},
     {&rsrc_class_t::u_rc_errors, &rsrc_class_t::rc_num_errors, nullptr, &format_for<rsrc_error_t>, "ClassErrors",
-     4 * sizeof(rsrc_error_t), 6, table_form::UNLOCATED, "errors", "error", "error"},
+     4 * sizeof(rsrc_error_t), 6, NOT_COUNTED, table_form::UNLOCATED, "errors", "error", "error"},
     {&rsrc_class_t::u_rc_depends, &rsrc_class_t::rc_num_depends, nullptr, &format_for<rsrc_depend_t>, "ClassDepends",
-     4 * sizeof(rsrc_depend_t), 7, table_form::UNLOCATED, "dependencies", "dependency", "dependency"},
+     4 * sizeof(rsrc_depend_t), 7, NOT_COUNTED, table_form::UNLOCATED, "dependencies", "dependency", "dependency"},
     {&rsrc_class_t::u_rc_variety_lists, nullptr, &rsrc_class_t::rc_varlist_size, nullptr, "ClassVarietyList",
-     4 * sizeof(variety_list_t), 10},
+     4 * sizeof(variety_list_t), 10, 7},
     {&rsrc_class_t::u_rc_sbs_defs, nullptr, &rsrc_class_t::rc_sbs_size, nullptr, "ClassSBSDefs", 8 * sizeof(sbs_def_t),
-     8, table_form::UNLOCATED},
-    {&rsrc_class_t::u_rc_sd_defs, nullptr, &rsrc_class_t::rc_sd_size, nullptr, "ClassSDDefs", 4 * sizeof(sd_def_t), 12},
+     8, NOT_COUNTED, table_form::UNLOCATED},
+    {&rsrc_class_t::u_rc_sd_defs, nullptr, &rsrc_class_t::rc_sd_size, nullptr, "ClassSDDefs", 4 * sizeof(sd_def_t), 12,
+     4},
     {&rsrc_class_t::u_rc_valid_vals, nullptr, &rsrc_class_t::rc_valval_size, nullptr, "ClassValidVals",
-     8 * sizeof(valid_values_t), 9},
-    {&rsrc_class_t::u_rc_strings, nullptr, nullptr, nullptr, "ClassStrings", 8192, 11, table_form::ROUNDED},
+     8 * sizeof(valid_values_t), 9, 8},
+    {&rsrc_class_t::u_rc_strings, nullptr, nullptr, nullptr, "ClassStrings", 8192, 11, NOT_COUNTED,
+     table_form::ROUNDED},
 };
 
 /* The first so many of them are tables of records; the first four, of attributes. */
@@ -123,6 +129,18 @@ inline constexpr std::array side_tables_as_made = [] {
     std::array<side_table, std::size(side_tables)> sorted = {};
     std::copy(std::begin(side_tables), std::end(side_tables), sorted.begin());
     std::sort(sorted.begin(), sorted.end(), [](const side_table &a, const side_table &b) { return a.made < b.made; });
+    return sorted;
+}();
+
+/* In the order in which the compiler counts them, without those that it does not count. */
+inline constexpr std::array side_tables_as_counted = [] {
+    constexpr auto COUNT = static_cast<std::size_t>(std::count_if(
+        std::begin(side_tables), std::end(side_tables), [](const side_table &t) { return t.counted != NOT_COUNTED; }));
+    std::array<side_table, COUNT> sorted = {};
+    std::copy_if(std::begin(side_tables), std::end(side_tables), sorted.begin(),
+                 [](const side_table &t) { return t.counted != NOT_COUNTED; });
+    std::sort(sorted.begin(), sorted.end(),
+              [](const side_table &a, const side_table &b) { return a.counted < b.counted; });
     return sorted;
 }();
 

@@ -84,6 +84,16 @@ TEST(format_sections, side_tables_as_made) {
     EXPECT_STREQ(cdb::side_tables_as_made[9].trace_name, "ClassValidVals");
 }
 
+/* The compiler names the first of several tables that are too large. */
+TEST(format_sections, side_tables_as_counted) {
+    std::vector<std::string_view> names;
+    for (const cdb::side_table &table : cdb::side_tables_as_counted)
+        names.emplace_back(table.trace_name);
+    EXPECT_EQ(names, (std::vector<std::string_view>{"ClassPattrsC", "ClassPattrs", "ClassDattrsC", "ClassDattrs",
+                                                    "ClassSDDefs", "ClassActionsC", "ClassActions", "ClassVarietyList",
+                                                    "ClassValidVals"}));
+}
+
 TEST(format_sections, lists) {
     EXPECT_EQ(cdb::list_kind_of(cdb::target::sd_defs).entry->record, "sd_field_t");
     EXPECT_EQ(cdb::list_kind_of(cdb::target::valid_vals).id, CDB_ID_VALID_VALUES);

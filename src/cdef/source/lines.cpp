@@ -123,7 +123,7 @@ bool is_plain_number(cdb::meaning as) {
     return false;
 }
 
-/* A required line that the compiler did not get before it had to go without. */
+/* True for a required line that the stanza did not have. */
 bool is_missing(const stanza_line &line, const stanza_record &from) {
     if (is_text(line))
         return from.may_lack_texts && text_in(line, from).empty();

@@ -1,5 +1,5 @@
-/* lines.h: the lines of a stanza, from the catalogue's attributes and the facts of the fields that they fill. An
- * attribute whose line reads as its field does is written without further ado: a new one needs nothing here. */
+/* lines.h: the lines of a stanza, from the catalogue's attributes and the facts of the fields that they fill. A new
+ * attribute whose line reads as its field does needs nothing here. */
 #ifndef CDGEN_CDEF_SOURCE_LINES_H
 #define CDGEN_CDEF_SOURCE_LINES_H
 

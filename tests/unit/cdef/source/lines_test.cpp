@@ -16,7 +16,7 @@ namespace {
 
 using namespace cdef::source;
 
-/* A record that gets a number and a text more than any real one. */
+/* A record that no database has, and the attributes of its stanza. */
 constexpr cdb::field fields[] = {
     {"id", 0, 4, 1, cdb::field_kind::number},
     {"text", 4, 8, 1, cdb::field_kind::reference, cdb::target::strings},

@@ -11,9 +11,10 @@
 namespace check {
 
 /* To add a warning: a class in a file of this folder, its maker, a row, and its id. */
-maker make_carriage_return, make_cut_short, make_element_type, make_incomplete, make_long_line, make_low_above_high,
-    make_narrowed, make_number_text, make_octal, make_permission, make_range_elsewhere, make_same_id, make_same_name,
-    make_sd_run_at_end, make_sd_without_run, make_stray_run, make_text_after_quote, make_unknown_locator,
+maker make_carriage_return, make_comment_in_value, make_cut_short, make_element_type, make_incomplete, make_long_line,
+    make_lost_bytes, make_low_above_high, make_narrowed, make_no_resource_class, make_number_text, make_octal,
+    make_overridden, make_permission, make_range_elsewhere, make_same_id, make_same_name, make_sd_run_at_end,
+    make_sd_without_run, make_second_resource_class, make_stray_run, make_text_after_quote, make_unknown_locator,
     make_unknown_variable_class, make_unused_default;
 
 namespace {
@@ -80,6 +81,31 @@ constexpr row rows[] = {
     {{ELEMENT_TYPE, "S513", "element-type", "an element's data type is unknown",
       "The `DataType` of an element is unknown, so type 0 is stored.", "Use one of the names in language.md."},
      make_element_type},
+    {{LOST_BYTES, "S521", "lost-bytes", "the first four bytes of a Binary are lost",
+      "A `Binary` value does not begin with `0x`. Its length is stored over its first four bytes, and the "
+      "rest is followed by zeros.",
+      "Write `0x` and two hexadecimal digits for each byte; the note shows them for short values."},
+     make_lost_bytes},
+    {{COMMENT_IN_VALUE, "S522", "comment-in-value", "a comment cuts a text short",
+      "A `#`, `//` or `/*` outside quotes directly follows a text, as in `http://host` or `Paper#Size`. "
+      "It begins a comment, so only what comes before it is stored.",
+      "Put the whole value in quotes. If it is a comment, put a blank in front of it."},
+     make_comment_in_value},
+    {{NO_RESOURCE_CLASS, "S523", "no-resource-class", "a class has no ResourceClass",
+      "No `ResourceClass` follows a `ControlDefinition`, so the class has no properties, no message "
+      "numbers and no name of its own. One in front of the first `ControlDefinition` is cleared by it.",
+      "Add a `ResourceClass` after the `ControlDefinition`."},
+     make_no_resource_class},
+    {{SECOND_RESOURCE_CLASS, "S524", "second-resource-class", "a class has two ResourceClass stanzas",
+      "A class has a second `ResourceClass`. It goes into the same record: what both give is replaced, "
+      "and properties are added.",
+      "Combine the two stanzas."},
+     make_second_resource_class},
+    {{OVERRIDDEN, "S525", "overridden", "a line replaces an earlier one",
+      "A type that is not an array has a second `DefaultValue`, or a valid value a second `ValueDisplayName`. "
+      "Only the last one counts.",
+      "Remove one of the lines. For a list of values, choose an array type."},
+     make_overridden},
     {{INCOMPLETE, "S515", "incomplete", "a stanza lacks required attributes",
       "A stanza lacks required attributes, which the compiler does not notice: their fields are 0.", "Add them."},
      make_incomplete},

@@ -60,6 +60,19 @@ TEST(TextAfterQuote, IsReportedFromTheQuote) {
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tDefaultValue=\"a\\\"b\"\n")), codes());
 }
 
+TEST(LostBytes, AreReportedForEachBoundWithout0x) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Binary", "\tDefaultValue=abcde\n")), codes{"S521 23:15+5"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Binary", "\tValidValue=0x61,b\n")), codes{"S521 23:18+1"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "BinaryArray", "\tDefaultValue=0x61\n")), codes());
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tDefaultValue=abcde\n")), codes());
+}
+
+TEST(CommentInValue, IsReportedDirectlyAfterAText) {
+    EXPECT_EQ(found_in(CLASS + persistent("A#B", "0", "String")), codes{"S522 17:8+2"});
+    EXPECT_EQ(found_in(CLASS + persistent("A // B", "0//1", "String#")), codes());
+    EXPECT_EQ(found_in(CLASS + persistent("\"A#B\"#C", "0", "String")), codes());
+}
+
 TEST(NumberText, IsReportedForTextAfterANumberAndForNone) {
     EXPECT_EQ(found_in(CLASS + persistent("A", "7 x", "UInt32")), codes{"S510 20:5+3"});
     EXPECT_EQ(found_in(CLASS + persistent("A", "x", "UInt32")), codes{"S510 20:5+1"});
@@ -131,6 +144,31 @@ TEST(UnknownVariableClass, IsReportedOnceForEachName) {
     std::string defined = "ResourceVariableClass\n\tVariableClass=V\n\tObservationInterval=1\n\tReportingInterval=1\n";
     EXPECT_EQ(found_in(source), codes{"S505 24:16+1"});
     EXPECT_EQ(found_in(source + defined), codes());
+}
+
+/* ---- Given not at all, or twice -------------------------------------------------------------------------------- */
+
+TEST(NoResourceClass, IsReportedForEachClass) {
+    std::string without = CLASS;
+    without.erase(without.find("ResourceClass"), without.find("ClassTo") - without.find("ResourceClass"));
+    EXPECT_EQ(found_in(without), codes{"S523 1:1+17"});
+    EXPECT_EQ(found_in(CLASS.substr(0, CLASS.find("ClassTo")) + without), codes{"S523 10:1+17"});
+}
+
+TEST(SecondResourceClass, IsReportedWithinAClass) {
+    std::string again = CLASS.substr(CLASS.find("ResourceClass"), CLASS.find("ClassTo") - CLASS.find("ResourceClass"));
+    EXPECT_EQ(found_in(CLASS + again), codes{"S524 16:1+13"});
+    EXPECT_EQ(found_in(CLASS + CLASS.substr(0, CLASS.find("ClassTo"))), codes());
+}
+
+TEST(Overridden, IsReportedAtTheLineThatCounts) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tDefaultValue=1\n\tDefaultValue=1\n")),
+              codes{"S525 24:2+14"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32Array", "\tDefaultValue=1\n\tDefaultValue=1\n")), codes());
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32",
+                                          "\tValidValue=1\n\tValueDisplayName=1\n\tValueDisplayName=2\n"
+                                          "\tValidValue=2\n\tValueDisplayName=3\n")),
+              codes{"S525 25:2+18"});
 }
 
 /* ---- Stanzas and runs ------------------------------------------------------------------------------------------ */

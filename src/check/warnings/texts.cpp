@@ -1,0 +1,136 @@
+/* texts.cpp: warnings about texts of which only a part is stored, or which are read otherwise than they look. */
+
+#include "check/warnings/watcher.h"
+#include "format/data_types.h"
+#include "text/hex.h"
+
+#include <algorithm>
+#include <cstdlib>
+#include <span>
+#include <string>
+
+namespace check {
+
+namespace {
+
+bool is_binary(const view &see) {
+    return scalar_vx(see.compiler.data_type()) == VX_BINARY_PTR;
+}
+
+bool is_string(const view &see) {
+    return scalar_vx(see.compiler.data_type()) == VX_CHAR_PTR;
+}
+
+bool is_valid_value(const view &see) {
+    return see.attr().ta_type == AT_VALID_VALUE || see.attr().ta_type == AT_SD_VALID_VALUE;
+}
+
+/* The bytes that a text with escapes stands for. The compiler has accepted it. */
+std::string unescaped(std::string_view text) {
+    std::string bytes;
+    for (size_t at = 0; at < text.size(); ++at) {
+        bytes += text[at];
+        if (text[at] != '\\')
+            continue;
+        std::string digits(text.substr(at + 1, 3));
+        if (digits.starts_with('\\')) {
+            ++at;
+            continue;
+        }
+        char *end = nullptr;
+        bytes.back() = static_cast<char>(std::strtol(digits.c_str(), &end, 8));
+        at += static_cast<size_t>(end - digits.c_str());
+    }
+    return bytes;
+}
+
+std::string hex_text(const std::string &bytes) {
+    return "`0x" + text::hex_of(std::as_bytes(std::span(bytes))) + "`";
+}
+
+/* Without 0x, the length of a Binary is stored over its first four bytes. */
+class lost_bytes : public watcher {
+public:
+    using watcher::watcher;
+    static constexpr std::array types = {AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
+
+    void value(const view &see) override {
+        if (!is_binary(see) ||
+            (see.known.kind == SC_PERSISTENT_CLASS_ATTRIBUTE && see.attr().ta_type == AT_DEFAULT_VALUE))
+            return;
+        if (!is_valid_value(see))
+            return look_at(see, see.value(), 0);
+        bounds both(see.value());
+        look_at(see, both.low, 0);
+        if (both.two())
+            look_at(see, both.high, both.offset);
+    }
+
+private:
+    void look_at(const view &see, std::string_view part, size_t offset) {
+        constexpr size_t LOST = 4, SHOWN_MAX = 16; /* bytes */
+        if (part.starts_with('0'))
+            return;
+        std::string bytes = unescaped(part);
+        std::string stored = bytes.substr(std::min(LOST, bytes.size()));
+        stored.resize(bytes.size(), '\0');
+        place at = see.part_of_value(offset, part.size());
+        bool is_short = bytes.size() <= SHOWN_MAX;
+        report(see, at,
+               "the first four bytes of a Binary without `0x` are lost" +
+                   (is_short ? ": stored are " + hex_text(stored) : std::string()),
+               {at, is_short ? "write " + hex_text(bytes) : "write `0x` and two hexadecimal digits for each byte"});
+    }
+};
+
+/* A comment after a blank is meant as one. */
+class comment_in_value : public watcher {
+public:
+    using watcher::watcher;
+    static constexpr std::array types = {AT_STRING,      AT_SD_NAME,        AT_MANAGER,       AT_LOCATOR,
+                                         AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
+
+    void value(const view &see) override {
+        std::string_view raw = see.line.raw;
+        place value = see.value_place();
+        size_t begin = value.column - 1, end = begin + value.length;
+        std::string_view rest = raw.substr(std::min(end, raw.size()));
+        bool comment = rest.starts_with('#') || rest.starts_with("//") || rest.starts_with("/*");
+        if (!comment || !is_text(see))
+            return;
+        rest = rest.substr(0, rest.find_last_not_of(" \t\r") + 1);
+        std::string sign(rest.substr(0, rest.starts_with('#') ? 1 : 2));
+        std::string_view whole = raw.substr(begin, value.length + rest.size());
+        std::string cure = whole.find_first_of("\"\\") == std::string_view::npos
+                               ? "write `" + std::string(see.attr().ta_name) + "=\"" + std::string(whole) + "\"`"
+                               : std::string("quote the value");
+        place at = {value.line, end + 1, rest.size()};
+        report(see, at, "`" + sign + "` begins a comment here: stored is `" + std::string(see.value()) + "`",
+               {at, cure + ", or put a blank in front of a comment"});
+    }
+
+private:
+    static bool is_text(const view &see) {
+        switch (see.attr().ta_type) {
+        case AT_STRING:
+        case AT_SD_NAME:
+        case AT_MANAGER:
+        case AT_LOCATOR:
+            return true;
+        default:
+            return is_string(see) || is_binary(see);
+        }
+    }
+};
+
+} // namespace
+
+made_watcher make_lost_bytes(const watcher_setup &setup) {
+    return make<lost_bytes>(setup);
+}
+
+made_watcher make_comment_in_value(const watcher_setup &setup) {
+    return make<comment_in_value>(setup);
+}
+
+} // namespace check

@@ -35,8 +35,8 @@ void findings::warn(const warning &known, const place &at, const std::string &so
 
 void findings::retract(warning_id id, int line) {
     const std::vector<size_t> &positions = of_warning[id];
-    for (auto position = positions.rbegin(); position != positions.rend(); ++position) {
-        entry &each = entries[*position];
+    for (size_t left = positions.size(); left > 0; --left) {
+        entry &each = entries[positions[left - 1]];
         if (each.found.at.line < line)
             return;
         if (each.found.at.line != line || each.retracted)

@@ -167,10 +167,7 @@ consteval srtable_ctrl stanza(const char *name, staged_record record, const tabl
             .sc_sd_owner = nullptr};
 }
 
-template <std::size_t Count>
-consteval srtable_ctrl attribute(const char *name, staged_record record, const table_attrs (&attrs)[Count],
-                                 const attr_kind &kind, int dt_offset) {
-    srtable_ctrl row = stanza(name, record, attrs);
+consteval srtable_ctrl attribute(srtable_ctrl row, const attr_kind &kind, int dt_offset) {
     row.dt_offset = dt_offset;
     row.sc_attr = &kind;
     return row;
@@ -193,10 +190,10 @@ constexpr std::array<srtable_ctrl, SC_COUNT + 1> catalogue = {{
     stanza("ClassToManagerMapping", STAGED_CMMAP, cmmap_attrs, TABLES_OF_CMMAP),
     stanza("ResourceVariableClass", STAGED_VARIABLE_CLASS, variable_class_attrs, TABLES_OF_VARIABLE_CLASS),
     stanza("ResourceClass", STAGED_CLASS, class_attrs),
-    attribute("PersistentResourceAttribute", STAGED_PATTR, pattr_attrs, pattr_kind, PATTR_TYPE),
-    attribute("PersistentClassAttribute", STAGED_PATTR_C, pattr_attrs, pattr_kind, PATTR_TYPE),
-    attribute("DynamicResourceAttribute", STAGED_DATTR, dattr_attrs, dattr_kind, DATTR_TYPE),
-    attribute("DynamicClassAttribute", STAGED_DATTR_C, dattr_attrs, dattr_kind, DATTR_TYPE),
+    attribute(stanza("PersistentResourceAttribute", STAGED_PATTR, pattr_attrs), pattr_kind, PATTR_TYPE),
+    attribute(stanza("PersistentClassAttribute", STAGED_PATTR_C, pattr_attrs), pattr_kind, PATTR_TYPE),
+    attribute(stanza("DynamicResourceAttribute", STAGED_DATTR, dattr_attrs), dattr_kind, DATTR_TYPE),
+    attribute(stanza("DynamicClassAttribute", STAGED_DATTR_C, dattr_attrs), dattr_kind, DATTR_TYPE),
     stanza("ClassAction", STAGED_ACTION_C, action_attrs),
     stanza("ResourceAction", STAGED_ACTION, action_attrs),
     sd_stanza("PAttrSDDefinition", pattr_owner),

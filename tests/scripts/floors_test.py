@@ -26,8 +26,8 @@ def library(directory, folder, **sources):
     objects = place / "CMakeFiles" / f"{folder}.dir"
     objects.mkdir(parents=True)
     for name, text in sources.items():
-        (objects / f"{name}.cpp").write_text(text)
-        subprocess.run(["c++", "-c", "-o", objects / f"{name}.cpp.o", objects / f"{name}.cpp"], check=True)
+        (place / f"{name}.cpp").write_text(text)
+        subprocess.run(["c++", "-c", "-o", objects / f"{name}.cpp.o", place / f"{name}.cpp"], check=True)
     made = place / f"lib{folder}.a"
     subprocess.run(["ar", "rc", made, *objects.glob("*.o")], check=True)
     return made
@@ -49,9 +49,17 @@ def test_chain_is_no_circle(floors):
     assert floors.circles_in({"a": {"b"}, "b": {"c"}, "c": set()}) == []
 
 
-def test_arrows_follow_symbols(floors, directory):
+def test_arrows_follow_symbols(floors, directory, monkeypatch):
+    monkeypatch.setattr(floors, "ROOT", directory)
     made = library(directory, "low", up="int down(); int up() { return down(); }", down="int down() { return 1; }")
     assert floors.arrows_of(made) == {"up.cpp": {"down.cpp"}, "down.cpp": set()}
+
+
+def test_object_of_a_removed_source_counts_no_more(floors, directory, monkeypatch):
+    monkeypatch.setattr(floors, "ROOT", directory)
+    made = library(directory, "low", up="int down(); int up() { return down(); }", down="int down() { return 1; }")
+    (directory / "src/low/up.cpp").unlink()
+    assert floors.arrows_of(made) == {"down.cpp": set()}
 
 
 def test_missing_symbol_is_found(floors, directory):

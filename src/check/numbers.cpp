@@ -9,6 +9,7 @@
 #include <cerrno>
 #include <cstdlib>
 #include <string>
+#include <utility>
 
 namespace check {
 
@@ -37,9 +38,11 @@ std::string_view number::rest() const {
 }
 
 bool is_plain(std::string_view text, int bits) {
-    size_t safe_digits = bits == 16 ? 4 : 9;
+    constexpr std::string_view MOST_16 = "65535";
+    size_t safe_digits = bits == 16 ? MOST_16.size() : 9;
     return !text.empty() && text.size() <= safe_digits && (text[0] != '0' || text.size() == 1) &&
-           std::all_of(text.begin(), text.end(), [](char c) { return c >= '0' && c <= '9'; });
+           std::all_of(text.begin(), text.end(), [](char c) { return c >= '0' && c <= '9'; }) &&
+           (bits != 16 || text.size() < MOST_16.size() || text <= MOST_16);
 }
 
 bounds::bounds(std::string_view text) : low(text), high(text) {
@@ -59,6 +62,7 @@ bool is_numeric(vx_data_type_t type) {
 bool number_part::is_plain() const {
     switch (form) {
     case number_form::BITS16:
+    case number_form::INDEX: /* one of more bits may be the first that an attribute cannot store */
         return check::is_plain(text, 16);
     case number_form::BITS32:
     case number_form::INT32:
@@ -151,6 +155,8 @@ bool is_low_above_high(bool variety, vx_data_type_t type, std::string_view value
     bounds both(value);
     auto low = [&] { return std::string(both.low); };
     auto high = [&] { return std::string(both.high); };
+    if (is_plain(both.low, 32) && is_plain(both.high, 32)) /* the same in all types and bases */
+        return std::pair(both.low.size(), both.low) > std::pair(both.high.size(), both.high);
     switch (variety ? VX_UINT32 : scalar_vx(type)) {
     case VX_FLOAT32:
     case VX_FLOAT64:

@@ -26,7 +26,7 @@ private:
     void convert(int base);
 };
 
-/* Only decimal digits, too few to overflow the bits, and no leading 0. */
+/* Only decimal digits without a leading 0, which surely fit: up to 65535 in 16 bits, up to 9 digits in 32. */
 bool is_plain(std::string_view text, int bits);
 
 /* "low,high". Without a comma both are the whole text. */

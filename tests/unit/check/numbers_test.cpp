@@ -36,9 +36,9 @@ TEST(Number, OverflowsBeyond64Bits) {
 }
 
 TEST(PlainNumber, HasFewDigitsAndNoLeadingZero) {
-    for (const char *text : {"0", "1", "9999"})
+    for (const char *text : {"0", "1", "9999", "10000", "65535"})
         EXPECT_TRUE(check::is_plain(text, 16)) << text;
-    for (const char *text : {"", "00", "10000", "-1", "1 ", "0x1"})
+    for (const char *text : {"", "00", "01234", "65536", "99999", "100000", "-1", "1 ", "0x1"})
         EXPECT_FALSE(check::is_plain(text, 16)) << text;
     EXPECT_TRUE(check::is_plain("999999999", 32));
     EXPECT_FALSE(check::is_plain("4294967295", 32));
@@ -74,6 +74,14 @@ TEST(NumbersIn, OfAVersionAreFourAndARest) {
     EXPECT_EQ(parts(AT_VERSION, VX_UNKNOWN, "1.2"), "1@0 2@2 ");
     EXPECT_EQ(parts(AT_VERSION, VX_UNKNOWN, "1..3.4"), "1@0 @2 3@3 4@5 ");
     EXPECT_EQ(parts(AT_VERSION, VX_UNKNOWN, "1.2.3.4.5.6"), "1@0 2@2 3@4 4@6 5.6@8 ");
+}
+
+TEST(LowAboveHigh, ComparesPlainNumbersByTheirValues) {
+    for (vx_data_type_t type : {VX_INT32, VX_UINT64, VX_FLOAT64}) {
+        EXPECT_TRUE(check::is_low_above_high(false, type, "10,9"));
+        EXPECT_FALSE(check::is_low_above_high(false, type, "9,10"));
+        EXPECT_FALSE(check::is_low_above_high(false, type, "10,10"));
+    }
 }
 
 TEST(LowAboveHigh, ComparesAsTheTypeDoes) {

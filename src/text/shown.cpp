@@ -95,6 +95,9 @@ std::string quoted_ascii(std::string_view bytes) {
 }
 
 std::string masked(std::string_view bytes) {
+    auto is_plain = [](char c) { return c == '\t' || (c >= ' ' && c <= '~'); };
+    if (std::all_of(bytes.begin(), bytes.end(), is_plain)) /* nearly all texts are */
+        return std::string(bytes);
     std::string shown;
     while (!bytes.empty()) {
         std::size_t length = length_or_1(bytes);

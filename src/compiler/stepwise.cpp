@@ -51,6 +51,8 @@ void stepwise_compiler::close() {
 }
 
 void stepwise_compiler::take_line(const attr_text &text) {
+    if (text.name != text.line) /* an attribute line begins no stanza */
+        return ::take_line(cx, text);
     auto before =
         std::tuple(cx.framing.scp, cx.framing.prev_scp, cx.framing.curr_sd_scp, cx.framing.state, cx.framing.table_id);
     try {

@@ -2,9 +2,8 @@
 
 #include "check/current_line.h"
 
-#include "language/limits.h"
-
 #include <algorithm>
+#include <cstring>
 #include <functional>
 
 namespace check {
@@ -18,10 +17,24 @@ bool is_within(const char *p, const char *begin, const char *end) {
 } // namespace
 
 void current_line::read(const source_line &source, int line_number) {
-    raw.assign(source.begin, source.end);
+    size_t length = std::min(static_cast<size_t>(source.end - source.begin), read_bytes.size());
+    memcpy(read_bytes.data(), source.begin, length);
+    raw = {read_bytes.data(), length};
+    find_return(source);
     number = line_number;
     continues = fills_piece;
     fills_piece = raw.size() == LINE_MAX_CHARS;
+}
+
+/* Carriage returns are rare. Where the next one is, is found once for all that the buffer holds. */
+void current_line::find_return(const source_line &source) {
+    bool read_anew = read_end != source.read_end || source.begin <= begin;
+    begin = source.begin;
+    if (!read_anew && next_return >= begin)
+        return;
+    read_end = source.read_end;
+    const void *found = memchr(begin, '\r', static_cast<size_t>(read_end - begin));
+    next_return = found == nullptr ? read_end : static_cast<const char *>(found);
 }
 
 void current_line::end_source() {
@@ -33,23 +46,13 @@ attr_text current_line::replaced(std::string_view by, size_t added) {
     size_t length = std::min(by.size(), copy.size() - 1);
     std::copy_n(by.begin(), length, copy.begin());
     copy[length] = '\0';
-    copy_added = added;
+    copy_added = static_cast<std::ptrdiff_t>(added);
     size_t blanks = std::min(std::string_view(copy.data(), length).find_first_not_of(" \t"), length);
     return {copy.data(), copy.data() + blanks, copy.data() + length};
 }
 
-size_t current_line::column_of(const char *in_text) const {
-    if (is_within(in_text, copy.data(), copy.data() + copy.size()))
-        return static_cast<size_t>(in_text - copy.data()) - copy_added + 1;
-    return static_cast<size_t>(in_text - text.line) + 1;
-}
-
 place current_line::all() const {
     return {number, column_of(text.name), whole().size()};
-}
-
-place current_line::part_of(const attr_place &attr, size_t offset, size_t length) const {
-    return {number, column_of(attr.value) + offset, length};
 }
 
 place current_line::marked(mark_kind kind, const attr_place &attr, const char *item) const {

@@ -4,8 +4,11 @@
 
 #include "check/check.h"
 #include "compiler/cdgen_read.h"
+#include "language/limits.h"
 
 #include <array>
+#include <cstddef>
+#include <functional>
 #include <string>
 #include <string_view>
 
@@ -13,6 +16,10 @@ namespace check {
 
 class current_line {
 public:
+    current_line() = default;
+    current_line(const current_line &) = delete;
+    current_line &operator=(const current_line &) = delete;
+
     /* The next line as it was read, with its number. */
     void read(const source_line &source, int number);
     /* Its text, without comment; end is null if it has none. The compiler takes the text apart in place. */
@@ -37,25 +44,42 @@ public:
     /* All of the text. */
     place all() const;
     /* Part of the value of an attribute of this line. */
-    place part_of(const attr_place &attr, size_t offset, size_t length) const;
+    place part_of(const attr_place &attr, size_t offset, size_t length) const {
+        return {number, column_of(attr.value) + offset, length};
+    }
     /* What an error of this line marks. item: what the error names, if it is a part of the line. */
     place marked(mark_kind kind, const attr_place &attr, const char *item = nullptr) const;
     /* The text at a place of this line. */
     std::string_view at(const place &part) const {
-        return std::string_view(raw).substr(part.column - 1, part.length);
+        return raw.substr(part.column - 1, part.length);
     }
 
-    std::string raw; /* the line as it was read */
+    /* Where in the line its first carriage return is; at or after its end if it has none. */
+    size_t carriage_return() const {
+        return static_cast<size_t>(next_return - begin);
+    }
+
+    std::string_view raw; /* the line as it was read */
     attr_text text = {};
     int number = 0;
     bool continues = false; /* the line is the rest of one that is too long to be read in one piece */
     bool ended = false;     /* the source has ended; raw is still its last line */
 
 private:
-    size_t column_of(const char *in_text) const;
+    bool is_copied(const char *in_text) const {
+        return std::greater_equal<>()(in_text, copy.data()) && std::less<>()(in_text, copy.data() + copy.size());
+    }
+    size_t column_of(const char *in_text) const {
+        return static_cast<size_t>(is_copied(in_text) ? in_text - copy.data() - copy_added : in_text - text.line) + 1;
+    }
+    void find_return(const source_line &source);
 
-    std::array<char, 512> copy; /* holds a replaced text */
-    size_t copy_added = 0;
+    std::array<char, LINE_MAX_CHARS> read_bytes; /* holds raw: the compiler takes the line itself apart */
+    const char *begin = nullptr;                 /* of the line, in the buffer */
+    const char *read_end = nullptr;              /* of what the buffer held when next_return was looked for */
+    const char *next_return = nullptr; /* the first carriage return from begin on, or read_end if there is none */
+    std::array<char, 512> copy;        /* holds a replaced text */
+    std::ptrdiff_t copy_added = 0;
     bool fills_piece = false;
 };
 

@@ -7,19 +7,19 @@
 
 namespace check {
 
-finding &findings::error(const message &known, const place &at, const std::string &source, std::string text) {
+finding &findings::error(const message &known, const place &at, std::string_view source, std::string text) {
     ++count.errors;
     entries.push_back({{.error = true,
                         .code = known.code,
                         .name = "error",
                         .text = std::move(text),
                         .at = at,
-                        .source = source,
+                        .source = std::string(source),
                         .notes = {}}});
     return entries.back().found;
 }
 
-void findings::warn(const warning &known, const place &at, const std::string &source, std::string text, note more) {
+void findings::warn(const warning &known, const place &at, std::string_view source, std::string text, note more) {
     ++count.warnings;
     of_warning[known.id].push_back(entries.size());
     entries.push_back({{.error = false,
@@ -27,7 +27,7 @@ void findings::warn(const warning &known, const place &at, const std::string &so
                         .name = known.name,
                         .text = std::move(text),
                         .at = at,
-                        .source = source,
+                        .source = std::string(source),
                         .notes = {}}});
     if (!more.text.empty())
         entries.back().found.notes.push_back(std::move(more));

@@ -7,6 +7,7 @@
 
 #include <array>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace check {
@@ -14,8 +15,8 @@ namespace check {
 class findings {
 public:
     /* The finding is to be completed with notes before the next one is added. */
-    finding &error(const message &known, const place &at, const std::string &source, std::string text);
-    void warn(const warning &known, const place &at, const std::string &source, std::string text, note more);
+    finding &error(const message &known, const place &at, std::string_view source, std::string text);
+    void warn(const warning &known, const place &at, std::string_view source, std::string text, note more);
     /* Takes back the warnings of a line, which an error now explains. */
     void retract(warning_id id, int line);
 

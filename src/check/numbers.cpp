@@ -38,11 +38,16 @@ std::string_view number::rest() const {
 }
 
 bool is_plain(std::string_view text, int bits) {
-    constexpr std::string_view MOST_16 = "65535";
-    size_t safe_digits = bits == 16 ? MOST_16.size() : 9;
-    return !text.empty() && text.size() <= safe_digits && (text[0] != '0' || text.size() == 1) &&
-           std::all_of(text.begin(), text.end(), [](char c) { return c >= '0' && c <= '9'; }) &&
-           (bits != 16 || text.size() < MOST_16.size() || text <= MOST_16);
+    constexpr size_t MOST_DIGITS = 9;
+    if (text.empty() || text.size() > MOST_DIGITS || (text[0] == '0' && text.size() > 1))
+        return false;
+    unsigned value = 0;
+    for (char c : text) {
+        if (c < '0' || c > '9')
+            return false;
+        value = value * 10 + static_cast<unsigned>(c - '0');
+    }
+    return bits != 16 || value <= 0xFFFF;
 }
 
 bounds::bounds(std::string_view text) : low(text), high(text) {

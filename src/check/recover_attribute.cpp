@@ -108,7 +108,7 @@ void recovery::recover_attribute(const fatal_exit &failure) {
     recover_value(failure, consequence);
     compiler.set_broken(known.kind);
     if (failure.id == MSG_OPTIONAL_TOO_EARLY)
-        take_quietly(std::string_view(line.raw).substr(0, line.all().column - 1 + line.all().length), 0);
+        take_quietly(line.raw.substr(0, line.all().column - 1 + line.all().length), 0);
     else
         note_refused(latest.attr == nullptr ? type_meant() : std::optional(latest.attr->ta_type));
     compiler.forget_overflow(); /* its mark would report the same number twice */

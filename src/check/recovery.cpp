@@ -129,7 +129,7 @@ void recovery::note_given() {
     if (given == 0)
         given = line.number;
     if (known.kind == SC_CLASS_TO_MANAGER_MAPPING)
-        known.map_values.push_back({see.value_place(), latest.attr->ta_name, line.raw});
+        known.map_values.push_back({see.value_place(), latest.attr->ta_name, std::string(line.raw)});
     if (latest.attr->ta_type == AT_SD_INDEX)
         index_lost = false;
 }

@@ -23,11 +23,15 @@ struct view {
     place part_of_value(size_t offset, size_t length) const {
         return line.part_of(compiler.latest(), offset, length);
     }
+    bool is_quoted() const {
+        size_t begin = value_place().column - 1;
+        return begin > 0 && line.raw[begin - 1] == '"';
+    }
     std::string_view value() const {
         return line.at(value_place());
     }
     mention value_mention() const {
-        return {value_place(), std::string(value()), line.raw};
+        return {value_place(), std::string(value()), std::string(line.raw)};
     }
     place name_place() const {
         return line.marked(mark_kind::name, compiler.latest());

@@ -56,7 +56,7 @@ source_line whole_line(source_file &source, char *begin, char *newline) {
     source.pos += static_cast<size_t>(newline - begin) + 1;
     if (source.mark < begin)
         source.mark = next_mark(begin);
-    return {begin, newline, source.mark};
+    return {begin, newline, source.buffer.data() + source.end, source.mark};
 }
 
 source_line cut_line(cdgen &cx, const char *begin, size_t length) {
@@ -64,7 +64,7 @@ source_line cut_line(cdgen &cx, const char *begin, size_t length) {
     memcpy(cx.source.inbuf, begin, length);
     cx.source.inbuf[length] = '\0';
     cx.source.cdb_fp.cut_mark = next_mark(cx.source.inbuf);
-    return {cx.source.inbuf, cx.source.inbuf + length, cx.source.cdb_fp.cut_mark};
+    return {cx.source.inbuf, cx.source.inbuf + length, cx.source.inbuf + length, cx.source.cdb_fp.cut_mark};
 }
 
 source_line some_line(cdgen &cx) {
@@ -77,7 +77,7 @@ source_line some_line(cdgen &cx) {
         if (there == LINE_MAX_CHARS || (!refill(cx) && there > 0))
             return cut_line(cx, source.buffer.data() + source.pos, there);
         if (source.end == 0)
-            return {nullptr, nullptr, source.mark};
+            return {nullptr, nullptr, nullptr, source.mark};
     }
 }
 

@@ -53,7 +53,8 @@ struct attr_text {
 struct source_line {
     char *begin; /* null: the source has no more lines */
     char *end;
-    char *&mark; /* the first mark from begin on; at or after end if the line has none */
+    const char *read_end; /* of the bytes that follow in the buffer */
+    char *&mark;          /* the first mark from begin on; at or after end if the line has none */
 };
 
 /* Fatal if the source cannot be opened or, later, read. */

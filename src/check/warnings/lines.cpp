@@ -13,26 +13,25 @@ class long_line : public watcher {
 public:
     using watcher::watcher;
 
-    void line(const view &see) override {
-        if (see.line.continues && !continued)
+    void continued_line(const view &see) override {
+        if (latest_piece != see.line.number - 1)
             report({see.line.number - 1, 0, 0}, {},
                    "line of more than 253 characters: the rest is read as a line of its own, and later lines count one "
                    "more");
-        continued = see.line.continues;
+        latest_piece = see.line.number;
     }
 
 private:
-    bool continued = false; /* the line before was not the first piece either */
+    int latest_piece = 0; /* the number of the latest line that was not a first piece */
 };
 
 /* Reports the first one only: usually all lines have one. */
-class carriage_return : public watcher {
+class first_return : public watcher {
 public:
     using watcher::watcher;
 
-    void line(const view &see) override {
-        size_t at = reported ? std::string::npos : see.line.raw.find('\r');
-        if (at == std::string::npos)
+    void carriage_return(const view &see, size_t at) override {
+        if (reported)
             return;
         reported = true;
         std::string where = at + 1 == see.line.raw.size() ? "at the end of" : "within";
@@ -51,7 +50,7 @@ made_watcher make_long_line(const watcher_setup &setup) {
 }
 
 made_watcher make_carriage_return(const watcher_setup &setup) {
-    return make<carriage_return>(setup);
+    return make<first_return>(setup);
 }
 
 } // namespace check

@@ -10,10 +10,7 @@ class text_after_quote : public watcher {
 public:
     using watcher::watcher;
 
-    void attribute(const view &see) override {
-        size_t begin = see.value_place().column - 1;
-        if (begin == 0 || see.line.raw[begin - 1] != '"')
-            return;
+    void quoted_value(const view &see) override {
         std::string_view text = see.value();
         size_t quote = text.find('"');
         while (quote != std::string_view::npos && quote > 0 && text[quote - 1] == '\\')

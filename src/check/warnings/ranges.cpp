@@ -24,7 +24,7 @@ public:
             report(see, see.text_place(), "this Range goes to the `DynamicResourceAttribute` that is still open",
                    begun(see, SC_DYNAMIC_RESOURCE_ATTRIBUTE));
         else
-            ranges.push_back({see.text_place(), see.known.kind, see.line.raw});
+            ranges.push_back({see.text_place(), see.known.kind, std::string(see.line.raw)});
     }
 
     void before_step(const view &see, int) override {

@@ -15,6 +15,7 @@ class watchers {
 public:
     watchers(const warning_set &wanted, findings &found);
 
+    /* All the events of a line that has been read. */
     void line(const view &see) const;
     /* All the events of an attribute line. */
     void attribute(const view &see) const;
@@ -25,6 +26,8 @@ public:
     void source_end(const view &see) const;
 
 private:
+    void odd_numbers(const view &see) const;
+
     std::vector<std::unique_ptr<watcher>> all;
     std::array<std::vector<watcher *>, EVENTS> of_event;
     std::array<std::vector<watcher *>, AT_COUNT> of_value; /* the warnings that look at an attribute type's values */

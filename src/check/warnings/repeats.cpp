@@ -18,7 +18,7 @@ public:
         if (kind == SC_CONTROL_DEFINITION) {
             place before = std::exchange(resource_class, {});
             early = control ? place{} : before;
-            control = mention{see.line.all(), {}, see.line.raw};
+            control = mention{see.line.all(), {}, std::string(see.line.raw)};
         } else if (kind == SC_RESOURCE_CLASS) {
             resource_class = see.line.all();
         }

@@ -12,6 +12,7 @@
 #include <bitset>
 #include <memory>
 #include <string>
+#include <string_view>
 #include <type_traits>
 
 namespace check {
@@ -31,12 +32,14 @@ public:
 
     /* ---- Events. A warning overrides those that it has an interest in. */
 
-    /* A line has been read; nothing has been taken from it. */
-    virtual void line(const view &) {}
-    /* The compiler has accepted an attribute line. */
-    virtual void attribute(const view &) {}
-    /* The same, if the attribute surely belongs to the current stanza: first for each number in the value
-     * that is not plain, */
+    /* A line has been read, nothing has been taken from it, and it is the rest of one that is too long; */
+    virtual void continued_line(const view &) {}
+    /* or it contains carriage returns, the first one at this position. */
+    virtual void carriage_return(const view &, size_t /* at */) {}
+    /* The compiler has accepted an attribute line whose value is in quotes. */
+    virtual void quoted_value(const view &) {}
+    /* It has accepted an attribute line, and the attribute surely belongs to the current stanza: first for each
+     * number in the value that is not plain, */
     virtual void number(const view &, const number_part &) {}
     /* then for the whole. Only for the attribute types that the class lists as `types`. */
     virtual void value(const view &) {}
@@ -54,7 +57,7 @@ public:
 
 protected:
     /* With a note, if it has a text. */
-    void report(const place &at, const std::string &source, std::string text, note more = {}) {
+    void report(const place &at, std::string_view source, std::string text, note more = {}) {
         to.found.warn(to.known, at, source, std::move(text), std::move(more));
     }
     /* About the current line. */
@@ -69,8 +72,9 @@ private:
 /* ---- Which events a warning overrides --------------------------------------------------------------------------- */
 
 enum event {
-    ON_LINE,
-    ON_ATTRIBUTE,
+    ON_CONTINUED_LINE,
+    ON_CARRIAGE_RETURN,
+    ON_QUOTED_VALUE,
     ON_NUMBER,
     ON_VALUE,
     ON_STANZA_END,
@@ -87,10 +91,12 @@ using event_set = std::array<bool, EVENTS>;
 template <class Warning> constexpr event_set events_of() {
     using seeing = void (watcher::*)(const view &);
     using seeing_kind = void (watcher::*)(const view &, int);
+    using seeing_position = void (watcher::*)(const view &, size_t);
     using seeing_number = void (watcher::*)(const view &, const number_part &);
     return {
-        !std::is_same_v<decltype(&Warning::line), seeing>,
-        !std::is_same_v<decltype(&Warning::attribute), seeing>,
+        !std::is_same_v<decltype(&Warning::continued_line), seeing>,
+        !std::is_same_v<decltype(&Warning::carriage_return), seeing_position>,
+        !std::is_same_v<decltype(&Warning::quoted_value), seeing>,
         !std::is_same_v<decltype(&Warning::number), seeing_number>,
         !std::is_same_v<decltype(&Warning::value), seeing>,
         !std::is_same_v<decltype(&Warning::stanza_end), seeing_kind>,

@@ -5,19 +5,31 @@
 namespace check {
 
 void watchers::line(const view &see) const {
-    for (watcher *each : of_event[ON_LINE])
-        each->line(see);
+    if (see.line.continues)
+        for (watcher *each : of_event[ON_CONTINUED_LINE])
+            each->continued_line(see);
+    if (of_event[ON_CARRIAGE_RETURN].empty())
+        return;
+    if (size_t at = see.line.carriage_return(); at < see.line.raw.size())
+        for (watcher *each : of_event[ON_CARRIAGE_RETURN])
+            each->carriage_return(see, at);
 }
 
-void watchers::attribute(const view &see) const {
-    for (watcher *each : of_event[ON_ATTRIBUTE])
-        each->attribute(see);
-    if (see.known.stanza().misplaced)
-        return;
+void watchers::odd_numbers(const view &see) const {
     for (const number_part &part : numbers_in(see.attr().ta_type, see.compiler.data_type(), see.value()))
         if (!part.is_plain())
             for (watcher *each : of_event[ON_NUMBER])
                 each->number(see, part);
+}
+
+void watchers::attribute(const view &see) const {
+    if (!of_event[ON_QUOTED_VALUE].empty() && see.is_quoted())
+        for (watcher *each : of_event[ON_QUOTED_VALUE])
+            each->quoted_value(see);
+    if (see.known.stanza().misplaced)
+        return;
+    if (!of_event[ON_NUMBER].empty())
+        odd_numbers(see);
     for (watcher *each : of_value[index_of(see.attr().ta_type)])
         each->value(see);
 }

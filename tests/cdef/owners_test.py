@@ -6,7 +6,8 @@ another one cuts short, and who has which valid values.  All four subcommands
 have to agree:
 
     verify    warns of each attribute that refers to a list that is not its own
-    dump      shows valid values with their owner, and with nobody else
+    dump      shows valid values with their owner, and with nobody else;
+              with --hex, as values of the owner's type
     source    writes them in their owner's stanza
     diff      adds them to their owner, compared to the class without them
 
@@ -207,9 +208,9 @@ class Programs:
     def __init__(self, directory):
         self.directory = directory
 
-    def compile(self, stanzas, name, *options):
-        """Compile the stanzas as the first of two classes."""
-        text = CLASS.format("First") + "".join(stanzas) + CLASS.format("Second") + MAP
+    def compile(self, stanzas, name, *options, following=CLASS.format("Second")):
+        """Compile the stanzas as the first of two classes, or with nothing following as the only one."""
+        text = CLASS.format("First") + "".join(stanzas) + following + MAP
         (self.directory / "source").write_text(text)
         command = [PROGRAMS.cdgen, *options, "source", name]
         subprocess.run(command, cwd=self.directory, check=True, capture_output=True, timeout=TIMEOUT)
@@ -241,6 +242,13 @@ def records_of(shown):
             yield record["u_sd_field_name"], record["at"], pairs_of(record["u_sd_valid_vals"])
 
 
+def values_in(annotated):
+    """The valid values that annotated bytes show: (low, high), in the order of the file."""
+    lows, highs = (re.findall(rf"vv_entry_t \d+, vv_{bound}_val: (?:\d+ at [0-9a-f]{{8}} )?(.*)", annotated)
+                   for bound in ("low", "high"))
+    return list(zip(lows, highs))
+
+
 def owners_in(source):
     """The valid values in each stanza of a source, by name."""
     owners, name = {}, None
@@ -260,6 +268,8 @@ def test_all_subcommands_name_the_owner(name, options, directory):
     programs.compile(case.stanzas, "made.cdef", *options)
     records = list(records_of(json.loads(programs.cdef("dump", "--json", "--offsets", "made.cdef"))))
     same({name: values for name, _, values in records if values}, case.values, "dump")
+    shown = [(json.dumps(low), json.dumps(high)) for values in case.values.values() for low, high in values]
+    same(values_in(programs.cdef("dump", "--hex", "made.cdef")), shown, "dump --hex")
     findings = json.loads(programs.cdef("verify", "--json", "made.cdef"))[0]["findings"]
     places = [finding["offset"] for finding in findings if finding["code"] == NOT_ITS_OWN]
     same({max((at, name) for name, at, _ in records if at <= place)[1] for place in places}, case.warned, "verify")
@@ -297,3 +307,20 @@ def test_dump_and_diff_take_a_bound_for_none(name, order, directory):
     before, after = PROGRAMS.images / f"small.{order}.cdef", PROGRAMS.images / f"broken/{name}.{order}.cdef"
     same([line.strip() for line in bounds_in(programs.cdef("dump", after))], shown, "dump")
     same(programs.cdef("diff", before, after), f"~ DynamicResourceAttribute 'd0': {changed}\n", "diff")
+
+
+@pytest.mark.parametrize("options", ([], ["-s"]), ids=("native", "reversed"))
+def test_annotated_elements_are_of_the_owners_type(options, directory):
+    """And not of an earlier attribute's, which has a range of another type that leads to the array as well.
+
+    88 is where E's initial value is in the strings: the four names take 32 bytes, D's initial value, an array with an
+    empty text, 24, and each of E's default bounds 16.
+    """
+    programs = Programs(directory)
+    programs.compile([
+        dynamic("Resource", "D", "StringArray"),
+        dynamic("Class", "C", "Int32", "Range=88,88"),
+        dynamic("Resource", "E", "Int32Array", "InitialValue=5"),
+    ], "made.cdef", *options, following="")
+    shown = re.sub(r"\d+ at [0-9a-f]{8} ", "", programs.cdef("dump", "--hex", "made.cdef"))
+    same(re.findall(r"vx_value_t 0: (.*)", shown), ['""', "0", "100", "5"], "elements")

@@ -4,6 +4,7 @@
 #include "text/hex.h"
 #include "cdef/dump/dump.h"
 #include "cdef/support/output.h"
+#include "reader/ownership.h"
 #include "reader/tables.h"
 #include "text/append.h"
 #include "text/shown.h"
@@ -24,7 +25,8 @@ bool starts(const cdb::region &r, std::string_view record) {
 
 class hex_form {
 public:
-    explicit hex_form(const cdb::database &shown) : db(shown), sections(shown.section_count()) {}
+    explicit hex_form(const cdb::database &shown)
+        : db(shown), owners(shown, cdb::verify(shown)), sections(shown.section_count()) {}
 
     void show();
 
@@ -44,6 +46,7 @@ private:
     std::string place_text(const cdb::bytes &area, std::size_t at) const;
 
     const cdb::database &db;
+    cdb::ownership owners;
     std::vector<std::optional<cdb::class_tables>> sections; /* as far as they have been asked for */
     types_by_place lists;                                   /* of valid values, by where they stand in the file */
     types_by_place arrays;                                  /* of their elements, likewise */
@@ -89,9 +92,9 @@ std::string hex_form::place_text(const cdb::bytes &area, std::size_t at) const {
     return shown;
 }
 
-/* Lists of valid values and arrays do not know their types; whoever refers to them does. */
+/* Lists of valid values and arrays do not name the types of their values; the record that owns them does. */
 void hex_form::note_types(const cdb::region &r) {
-    if (r.what == nullptr || !r.section)
+    if (r.what == nullptr || !r.section || !owners.is_own(r.offset))
         return;
     auto word = db.file().number<std::uint32_t>(r.offset);
     if (r.what->kind == cdb::field_kind::value) {

@@ -3,7 +3,6 @@
 #include "compiler/cdgen.h"
 
 #include "compiler/cdgen_closing.h"
-#include "compiler/cdgen_process.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -60,11 +59,6 @@ int report(const cdgen &cx, const fatal_exit &failure) {
 }
 
 } // namespace
-
-cdgen::~cdgen() {
-    discard_mapfile(*this);
-    set_unfinished_output(nullptr);
-}
 
 void compile(cdgen &cx) {
     cache_input_data(cx, cx.options.cdefsrc);

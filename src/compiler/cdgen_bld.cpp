@@ -1,31 +1,19 @@
-/* cdgen_bld.cpp: sizes, creates, maps and fills the output file. The image is written once, by a cursor that only moves
+/* cdgen_bld.cpp: sizes the image and writes it into the mapped output file, once, by a cursor that only moves
  * forward. Records go in and out of it by copying, since sections are not aligned. */
 
 #include "compiler/cdgen_image.h"
 
-#include "compiler/above_stdio.h"
 #include "compiler/cdgen_context.h"
-#include "compiler/cdgen_process.h"
 #include "compiler/cdgen_swap.h"
 #include "format/checksum.h"
 #include "format/sections.h"
 
 #include <algorithm>
-#include <array>
-#include <cerrno>
 #include <cstdlib>
-#include <fcntl.h>
 #include <limits>
-#include <sys/mman.h>
-#include <sys/stat.h>
 #include <sys/time.h>
-#include <sys/uio.h>
-#include <unistd.h>
-#include <utility>
 
 namespace {
-
-constexpr size_t PREFILL_BLOCK = 1024;
 
 size_t used_bytes(const cdb_ref_t &table) {
     const tbl_content *t = staged_content(table);
@@ -67,99 +55,6 @@ size_t class_size(rsrc_class_t &rc) {
     return size + strings_size(rc.u_rc_strings);
 }
 
-/* ---- The output file ------------------------------------------------------------------------------------------- */
-
-[[noreturn]] void cannot(message_id what, int error) {
-    bld_error_exit(what, strerror(error), nullptr, 1);
-}
-
-/* A descriptor that is closed unless it is handed on. */
-struct output_fd {
-    explicit output_fd(int opened) : fd(opened) {}
-    output_fd(const output_fd &) = delete;
-    output_fd &operator=(const output_fd &) = delete;
-    ~output_fd() {
-        if (fd >= 0)
-            close(fd);
-    }
-    int release() {
-        return std::exchange(fd, -1);
-    }
-
-    int fd;
-};
-
-bool is_stream(const struct stat &file, int stream) {
-    struct stat st = {};
-    return S_ISREG(file.st_mode) && fstat(stream, &st) == 0 && st.st_dev == file.st_dev && st.st_ino == file.st_ino;
-}
-
-/* Asked before it is opened: a source that has been deleted in the meantime may have left its inode number to the new
- * file. */
-void refuse_own_files(cdgen &cx) {
-    struct stat st = {};
-    if (stat(cx.options.cdefname, &st) != 0)
-        return;
-    if (st.st_dev == cx.source.cdb_fp.device && st.st_ino == cx.source.cdb_fp.inode)
-        bld_error_exit(MSG_CANNOT_CREATE, "it is the source file", nullptr, 1);
-    if (cx.options.debugLevel > 0 && (is_stream(st, STDOUT_FILENO) || is_stream(st, STDERR_FILENO)))
-        bld_error_exit(MSG_CANNOT_CREATE, "traces go there", nullptr, 1);
-}
-
-/* Emptied only once it is known not to be a file that the program uses. */
-int create_output(cdgen &cx) {
-    refuse_own_files(cx);
-    struct stat st = {};
-    output_fd out(above_stdio(open(cx.options.cdefname, O_RDWR | O_CREAT | O_CLOEXEC, 0644)));
-    if (out.fd < 0)
-        cannot(MSG_CANNOT_CREATE, errno);
-    if (fstat(out.fd, &st) != 0)
-        cannot(MSG_CANNOT_MAP, errno);
-    if (S_ISREG(st.st_mode))
-        set_unfinished_output(cx.options.cdefname);
-    if (S_ISREG(st.st_mode) && st.st_size > 0 && ftruncate(out.fd, 0) != 0)
-        cannot(MSG_CANNOT_CREATE, errno);
-    return out.release();
-}
-
-/* Writes 1024-byte zero blocks until there are at least size bytes, many of them at a time. */
-size_t prefill(int fd, size_t size) {
-    constexpr size_t BLOCKS_AT_ONCE = 512;
-    static std::array<char, PREFILL_BLOCK> zeros;
-    std::array<iovec, BLOCKS_AT_ONCE> blocks;
-    size_t gross = (size + PREFILL_BLOCK - 1) / PREFILL_BLOCK * PREFILL_BLOCK;
-    std::fill_n(blocks.begin(), std::min(blocks.size(), gross / PREFILL_BLOCK), iovec{zeros.data(), zeros.size()});
-    for (size_t written = 0; written < gross;) {
-        size_t left = gross - written;
-        blocks[0].iov_len = (left - 1) % PREFILL_BLOCK + 1; /* what a short write has left of its block */
-        size_t count = std::min(blocks.size(), (left - 1) / PREFILL_BLOCK + 1);
-        ssize_t n = writev(fd, blocks.data(), static_cast<int>(count));
-        if (n < 0 && errno == EINTR)
-            continue;
-        if (n <= 0)
-            cannot(MSG_CANNOT_CREATE, n < 0 ? errno : ENOSPC);
-        written += static_cast<size_t>(n);
-    }
-    return gross;
-}
-
-/* Only regular files can be mapped; a pipe, which might block, is not even written to. */
-char *get_mapfile(cdgen &cx, size_t size) {
-    output_fd out(create_output(cx));
-    struct stat st = {};
-    if (fstat(out.fd, &st) == 0 && !S_ISFIFO(st.st_mode))
-        cx.output.gross_file_size = prefill(out.fd, size);
-    if (fstat(out.fd, &st) != 0)
-        cannot(MSG_CANNOT_MAP, errno);
-    size_t length = S_ISREG(st.st_mode) ? static_cast<size_t>(st.st_size) : 0;
-    void *mapped = mmap(nullptr, length, PROT_READ | PROT_WRITE, MAP_SHARED, out.fd, 0);
-    if (mapped == MAP_FAILED)
-        cannot(MSG_CANNOT_MAP, errno);
-    cx.output.cdb_mapfile_fd = out.release();
-    cx.output.cdb_mapfile_ptr = mapped;
-    return static_cast<char *>(mapped);
-}
-
 template <class Record> Record load(const char *from) {
     Record record;
     memcpy(&record, from, sizeof record);
@@ -174,11 +69,7 @@ void flush_mapfile(cdgen &cx) {
     auto final_size = static_cast<off_t>(load<orb_cdb_header_t>(cx.image.chp).cdb_hdr_length) + 4;
     if (cx.options.swap_endianness)
         cdgen_cdef_swap(cx.image.chp, cx.stray.nowhere);
-    munmap(std::exchange(cx.output.cdb_mapfile_ptr, nullptr), cx.output.gross_file_size);
-    int fd = std::exchange(cx.output.cdb_mapfile_fd, 0);
-    [[maybe_unused]] int truncated = ftruncate(fd, final_size);
-    set_unfinished_output(nullptr);
-    close(fd);
+    cx.output.finish(final_size);
 }
 
 /* ---- Sections -------------------------------------------------------------------------------------------------- */
@@ -376,23 +267,7 @@ size_t fit_image(cdgen &cx) {
 
 namespace {
 
-/* Removes the output if it is not finished. */
-struct discarding {
-    explicit discarding(cdgen &context) : cx(context) {}
-    discarding(const discarding &) = delete;
-    discarding &operator=(const discarding &) = delete;
-    ~discarding() {
-        discard_mapfile(cx);
-    }
-
-    cdgen &cx;
-};
-
-} // namespace
-
-void bld_cdb(cdgen &cx) {
-    discarding unless_finished(cx);
-    cx.image.chp = get_mapfile(cx, fit_image(cx));
+void write_image(cdgen &cx) {
     cx.image.dsect_anchs = cx.image.chp + sizeof(orb_cdb_header_t);
     cx.image.dsect_idx = 0;
     cx.image.dsp = cx.image.dsect_anchs + sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.image.dsect_count);
@@ -405,11 +280,14 @@ void bld_cdb(cdgen &cx) {
     flush_mapfile(cx);
 }
 
-void discard_mapfile(cdgen &cx) {
-    if (cx.output.cdb_mapfile_fd <= 0)
-        return;
-    if (cx.output.cdb_mapfile_ptr != nullptr)
-        munmap(std::exchange(cx.output.cdb_mapfile_ptr, nullptr), cx.output.gross_file_size);
-    close(std::exchange(cx.output.cdb_mapfile_fd, 0));
-    remove(cx.options.cdefname);
+} // namespace
+
+void bld_cdb(cdgen &cx) {
+    cx.image.chp = get_mapfile(cx, fit_image(cx));
+    try {
+        write_image(cx);
+    } catch (...) { /* before the message is printed */
+        cx.output.discard();
+        throw;
+    }
 }

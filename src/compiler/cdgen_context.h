@@ -6,6 +6,7 @@
 #include "compiler/cdgen_framing.h"
 #include "compiler/cdgen_image.h"
 #include "compiler/cdgen_observer.h"
+#include "compiler/cdgen_output.h"
 #include "compiler/cdgen_sd_run.h"
 #include "compiler/cdgen_source.h"
 #include "compiler/cdgen_staging.h"
@@ -28,7 +29,6 @@ struct cdgen {
     cdgen() = default;
     cdgen(const cdgen &) = delete;
     cdgen &operator=(const cdgen &) = delete;
-    ~cdgen();
 
     compile_options options;
     source_reader source;

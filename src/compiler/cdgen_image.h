@@ -1,4 +1,4 @@
-/* cdgen_image.h: the image: its sizes, its sections and the output file. */
+/* cdgen_image.h: the image: its sizes and its sections. */
 #ifndef CDGEN_CDGEN_IMAGE_H
 #define CDGEN_CDGEN_IMAGE_H
 
@@ -24,13 +24,6 @@ struct stray_references {
     std::vector<size_t> nowhere;         /* their places in the image, in bytes */
 };
 
-/* The output file once it is mapped. */
-struct output_file {
-    int cdb_mapfile_fd = 0;
-    void *cdb_mapfile_ptr = nullptr;
-    size_t gross_file_size = 0; /* bytes pre-filled and mapped */
-};
-
 /* The image is reached by copying: sections are not aligned. */
 struct image_cursor {
     char *chp = nullptr;         /* the image: its header */
@@ -49,7 +42,5 @@ void add_rsrc_class_tbls(cdgen &cx);
 void add_rsrc_mgr_tbls(cdgen &cx);
 void add_rsrc_cmmap_tbls(cdgen &cx);
 void add_rsrc_var_class_tbls(cdgen &cx);
-/* Unmaps, closes and removes the output file if it is mapped. */
-void discard_mapfile(cdgen &cx);
 
 #endif

@@ -772,7 +772,7 @@ TEST_F(ImageFile, PlacesOfReferencesThatLeadNowhereAreHandedToTheReversal) {
 
 TEST_F(ImageFile, ThatIsNotMappedIsLeftAlone) {
     write_output("yesterday's");
-    discard_mapfile(cx);
+    cx.output.discard();
     EXPECT_TRUE(std::filesystem::exists(output));
 }
 
@@ -786,7 +786,7 @@ TEST_F(ImageFile, ThatIsMappedGoesWithTheContext) {
     write_output(std::string(1024, 'x'));
     {
         cdgen mapped;
-        mapped.options.cdefname = output.c_str();
+        mapped.output.name = output.c_str();
         mapped.output.cdb_mapfile_fd = dup(STDERR_FILENO);
     }
     EXPECT_FALSE(std::filesystem::exists(output));

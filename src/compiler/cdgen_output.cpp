@@ -1,0 +1,140 @@
+/* cdgen_output.cpp: creates, fills and maps the output file; finishes or removes it. */
+
+#include "compiler/cdgen_output.h"
+
+#include "compiler/above_stdio.h"
+#include "compiler/cdgen_context.h"
+#include "compiler/cdgen_process.h"
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+#include <fcntl.h>
+#include <sys/mman.h>
+#include <sys/stat.h>
+#include <sys/uio.h>
+#include <unistd.h>
+#include <utility>
+
+namespace {
+
+constexpr size_t PREFILL_BLOCK = 1024;
+
+[[noreturn]] void cannot(message_id what, int error) {
+    bld_error_exit(what, strerror(error), nullptr, 1);
+}
+
+/* A descriptor that is closed unless it is handed on. */
+struct output_fd {
+    explicit output_fd(int opened) : fd(opened) {}
+    output_fd(const output_fd &) = delete;
+    output_fd &operator=(const output_fd &) = delete;
+    ~output_fd() {
+        if (fd < 0)
+            return;
+        set_unfinished_output(nullptr);
+        close(fd);
+    }
+    int release() {
+        return std::exchange(fd, -1);
+    }
+
+    int fd;
+};
+
+bool is_stream(const struct stat &file, int stream) {
+    struct stat st = {};
+    return S_ISREG(file.st_mode) && fstat(stream, &st) == 0 && st.st_dev == file.st_dev && st.st_ino == file.st_ino;
+}
+
+/* Asked before it is opened: a source that has been deleted in the meantime may have left its inode number to the new
+ * file. */
+void refuse_own_files(cdgen &cx) {
+    struct stat st = {};
+    if (stat(cx.options.cdefname, &st) != 0)
+        return;
+    if (st.st_dev == cx.source.cdb_fp.device && st.st_ino == cx.source.cdb_fp.inode)
+        bld_error_exit(MSG_CANNOT_CREATE, "it is the source file", nullptr, 1);
+    if (cx.options.debugLevel > 0 && (is_stream(st, STDOUT_FILENO) || is_stream(st, STDERR_FILENO)))
+        bld_error_exit(MSG_CANNOT_CREATE, "traces go there", nullptr, 1);
+}
+
+/* Emptied only once it is known not to be a file that the program uses. */
+int create_output(cdgen &cx) {
+    refuse_own_files(cx);
+    struct stat st = {};
+    output_fd out(above_stdio(open(cx.options.cdefname, O_RDWR | O_CREAT | O_CLOEXEC, 0644)));
+    if (out.fd < 0)
+        cannot(MSG_CANNOT_CREATE, errno);
+    if (fstat(out.fd, &st) != 0)
+        cannot(MSG_CANNOT_MAP, errno);
+    if (S_ISREG(st.st_mode))
+        set_unfinished_output(cx.options.cdefname);
+    if (S_ISREG(st.st_mode) && st.st_size > 0 && ftruncate(out.fd, 0) != 0)
+        cannot(MSG_CANNOT_CREATE, errno);
+    return out.release();
+}
+
+/* Writes 1024-byte zero blocks until there are at least size bytes, many of them at a time. */
+size_t prefill(int fd, size_t size) {
+    constexpr size_t BLOCKS_AT_ONCE = 512;
+    static std::array<char, PREFILL_BLOCK> zeros;
+    std::array<iovec, BLOCKS_AT_ONCE> blocks;
+    size_t gross = (size + PREFILL_BLOCK - 1) / PREFILL_BLOCK * PREFILL_BLOCK;
+    std::fill_n(blocks.begin(), std::min(blocks.size(), gross / PREFILL_BLOCK), iovec{zeros.data(), zeros.size()});
+    for (size_t written = 0; written < gross;) {
+        size_t left = gross - written;
+        blocks[0].iov_len = (left - 1) % PREFILL_BLOCK + 1; /* what a short write has left of its block */
+        size_t count = std::min(blocks.size(), (left - 1) / PREFILL_BLOCK + 1);
+        ssize_t n = writev(fd, blocks.data(), static_cast<int>(count));
+        if (n < 0 && errno == EINTR)
+            continue;
+        if (n <= 0)
+            cannot(MSG_CANNOT_CREATE, n < 0 ? errno : ENOSPC);
+        written += static_cast<size_t>(n);
+    }
+    return gross;
+}
+
+} // namespace
+
+char *get_mapfile(cdgen &cx, size_t size) {
+    output_fd out(create_output(cx));
+    struct stat st = {};
+    if (fstat(out.fd, &st) == 0 && !S_ISFIFO(st.st_mode))
+        cx.output.gross_file_size = prefill(out.fd, size);
+    if (fstat(out.fd, &st) != 0)
+        cannot(MSG_CANNOT_MAP, errno);
+    size_t length = S_ISREG(st.st_mode) ? static_cast<size_t>(st.st_size) : 0;
+    void *mapped = mmap(nullptr, length, PROT_READ | PROT_WRITE, MAP_SHARED, out.fd, 0);
+    if (mapped == MAP_FAILED)
+        cannot(MSG_CANNOT_MAP, errno);
+    cx.output.cdb_mapfile_fd = out.release();
+    cx.output.cdb_mapfile_ptr = mapped;
+    cx.output.name = cx.options.cdefname;
+    return static_cast<char *>(mapped);
+}
+
+void output_file::finish(off_t size) {
+    unmap();
+    int fd = std::exchange(cdb_mapfile_fd, 0);
+    [[maybe_unused]] int truncated = ftruncate(fd, size);
+    set_unfinished_output(nullptr);
+    close(fd);
+}
+
+void output_file::discard() {
+    if (cdb_mapfile_fd <= 0)
+        return;
+    unmap();
+    close(std::exchange(cdb_mapfile_fd, 0));
+    remove(name);
+    set_unfinished_output(nullptr);
+}
+
+void output_file::unmap() {
+    if (cdb_mapfile_ptr != nullptr)
+        munmap(std::exchange(cdb_mapfile_ptr, nullptr), gross_file_size);
+}

@@ -1,17 +1,16 @@
-/* cdgen_output.cpp: creates, fills and maps the output file; finishes or removes it. */
+/* cdgen_output.cpp: creates, locks, fills and maps the output file; finishes or removes it. */
 
 #include "compiler/cdgen_output.h"
 
 #include "compiler/above_stdio.h"
 #include "compiler/cdgen_context.h"
-#include "compiler/cdgen_process.h"
 
 #include <algorithm>
 #include <array>
 #include <cerrno>
-#include <cstdio>
 #include <cstring>
 #include <fcntl.h>
+#include <sys/file.h>
 #include <sys/mman.h>
 #include <sys/stat.h>
 #include <sys/uio.h>
@@ -21,12 +20,18 @@
 namespace {
 
 constexpr size_t PREFILL_BLOCK = 1024;
+constexpr int MOST_TRIES = 16; /* to open a file that other programs remove or replace */
 
-[[noreturn]] void cannot(message_id what, int error) {
-    bld_error_exit(what, strerror(error), nullptr, 1);
+[[noreturn]] void cannot(message_id what, const char *reason) {
+    bld_error_exit(what, reason, nullptr, 1);
 }
 
-/* A descriptor that is closed unless it is handed on. */
+[[noreturn]] void cannot(message_id what, int error) {
+    cannot(what, strerror(error));
+}
+
+/* A descriptor that is closed unless it is handed on. Closing it gives up the lock, so that no signal may remove the
+ * file afterwards. */
 struct output_fd {
     explicit output_fd(int opened) : fd(opened) {}
     output_fd(const output_fd &) = delete;
@@ -37,6 +42,8 @@ struct output_fd {
         set_unfinished_output(nullptr);
         close(fd);
     }
+    output_fd(output_fd &&other) noexcept : fd(other.release()) {}
+    output_fd &operator=(output_fd &&) = delete;
     int release() {
         return std::exchange(fd, -1);
     }
@@ -61,20 +68,54 @@ void refuse_own_files(cdgen &cx) {
         bld_error_exit(MSG_CANNOT_CREATE, "traces go there", nullptr, 1);
 }
 
-/* Emptied only once it is known not to be a file that the program uses. */
-int create_output(cdgen &cx) {
+/* Keeps other compilers off the file until it is closed. Where the file system has no locks, nothing does. */
+void lock_output(int fd) {
+    if (flock(fd, LOCK_EX | LOCK_NB) == 0)
+        return;
+    if (errno == EWOULDBLOCK)
+        cannot(MSG_CANNOT_CREATE, "another program has locked it");
+    if (errno != EOPNOTSUPP && errno != ENOSYS && errno != ENOLCK && errno != EINVAL)
+        cannot(MSG_CANNOT_CREATE, errno);
+}
+
+/* The output, opened but not yet changed; st says what it is. A regular file is locked. If it lost its name before
+ * that, because another compiler failed and removed it, it is closed again. Signals are held back so that none leaves
+ * behind the empty file that opening may have made. */
+output_fd open_once(cdgen &cx, struct stat &st) {
     refuse_own_files(cx);
-    struct stat st = {};
+    held_signals until_begun;
     output_fd out(above_stdio(open(cx.options.cdefname, O_RDWR | O_CREAT | O_CLOEXEC, 0644)));
     if (out.fd < 0)
         cannot(MSG_CANNOT_CREATE, errno);
     if (fstat(out.fd, &st) != 0)
         cannot(MSG_CANNOT_MAP, errno);
-    if (S_ISREG(st.st_mode))
-        set_unfinished_output(cx.options.cdefname);
-    if (S_ISREG(st.st_mode) && st.st_size > 0 && ftruncate(out.fd, 0) != 0)
-        cannot(MSG_CANNOT_CREATE, errno);
-    return out.release();
+    if (!S_ISREG(st.st_mode))
+        return out;
+    lock_output(out.fd);
+    if (fstat(out.fd, &st) != 0) /* its size while it is locked */
+        cannot(MSG_CANNOT_MAP, errno);
+    cx.output.begun = {cx.options.cdefname, st.st_dev, st.st_ino};
+    if (!cx.output.begun.has_its_name())
+        return output_fd(-1);
+    if (st.st_size == 0)
+        set_unfinished_output(&cx.output.begun);
+    return out;
+}
+
+/* Emptied only once it is locked and known not to be a file that the program uses. */
+output_fd create_output(cdgen &cx) {
+    for (int tries = 0; tries < MOST_TRIES; ++tries) {
+        struct stat st = {};
+        output_fd out = open_once(cx, st);
+        if (out.fd < 0)
+            continue;
+        if (S_ISREG(st.st_mode))
+            set_unfinished_output(&cx.output.begun);
+        if (S_ISREG(st.st_mode) && st.st_size > 0 && ftruncate(out.fd, 0) != 0)
+            cannot(MSG_CANNOT_CREATE, errno);
+        return out;
+    }
+    cannot(MSG_CANNOT_CREATE, "other programs keep replacing it");
 }
 
 /* Writes 1024-byte zero blocks until there are at least size bytes, many of them at a time. */
@@ -107,31 +148,38 @@ char *get_mapfile(cdgen &cx, size_t size) {
         cx.output.gross_file_size = prefill(out.fd, size);
     if (fstat(out.fd, &st) != 0)
         cannot(MSG_CANNOT_MAP, errno);
-    size_t length = S_ISREG(st.st_mode) ? static_cast<size_t>(st.st_size) : 0;
+    if (S_ISREG(st.st_mode) && std::cmp_less(st.st_size, cx.output.gross_file_size))
+        cannot(MSG_CANNOT_MAP, CUT_OUTPUT);
+    size_t length = S_ISREG(st.st_mode) ? cx.output.gross_file_size : 0;
     void *mapped = mmap(nullptr, length, PROT_READ | PROT_WRITE, MAP_SHARED, out.fd, 0);
     if (mapped == MAP_FAILED)
         cannot(MSG_CANNOT_MAP, errno);
     cx.output.cdb_mapfile_fd = out.release();
     cx.output.cdb_mapfile_ptr = mapped;
-    cx.output.name = cx.options.cdefname;
     return static_cast<char *>(mapped);
 }
 
 void output_file::finish(off_t size) {
     unmap();
-    int fd = std::exchange(cdb_mapfile_fd, 0);
-    [[maybe_unused]] int truncated = ftruncate(fd, size);
-    set_unfinished_output(nullptr);
-    close(fd);
+    struct stat st = {};
+    bool cut = fstat(cdb_mapfile_fd, &st) == 0 && std::cmp_less(st.st_size, gross_file_size);
+    [[maybe_unused]] int truncated = cut ? 0 : ftruncate(cdb_mapfile_fd, size);
+    close_mapfile();
+    if (cut)
+        cannot(MSG_CANNOT_MAP, CUT_OUTPUT);
 }
 
 void output_file::discard() {
     if (cdb_mapfile_fd <= 0)
         return;
     unmap();
-    close(std::exchange(cdb_mapfile_fd, 0));
-    remove(name);
+    begun.remove(); /* while it is locked: afterwards, it may be another compiler's */
+    close_mapfile();
+}
+
+void output_file::close_mapfile() {
     set_unfinished_output(nullptr);
+    close(std::exchange(cdb_mapfile_fd, 0));
 }
 
 void output_file::unmap() {

@@ -2,12 +2,14 @@
 #ifndef CDGEN_CDGEN_OUTPUT_H
 #define CDGEN_CDGEN_OUTPUT_H
 
+#include "compiler/cdgen_process.h"
+
 #include <cstddef>
 #include <sys/types.h>
 
 struct cdgen;
 
-/* The output file once it is mapped; removes itself unless it is finished. */
+/* The output file, locked, once it is mapped; removes itself unless it is finished. */
 struct output_file {
     output_file() = default;
     output_file(const output_file &) = delete;
@@ -16,22 +18,24 @@ struct output_file {
         discard();
     }
 
-    /* Unmaps the file, cuts it to size bytes and closes it. */
+    /* Unmaps the file, cuts it to size bytes and closes it. A file that another program has cut meanwhile is left as it
+     * is, and ends the compilation. */
     void finish(off_t size);
-    /* Unmaps, closes and removes the file if it is mapped. */
+    /* Unmaps, removes and closes the file if it is mapped. */
     void discard();
 
     int cdb_mapfile_fd = 0;
     void *cdb_mapfile_ptr = nullptr;
     size_t gross_file_size = 0; /* bytes pre-filled and mapped */
-    const char *name = nullptr;
+    unfinished_output begun;
 
 private:
     void unmap();
+    void close_mapfile();
 };
 
-/* Creates the options' cdefname, fills it with at least size zero bytes and maps it. Only regular files can be mapped;
- * a pipe, which might block, is not even written to. */
+/* Creates the options' cdefname or empties it, fills it with at least size zero bytes and maps it. Only regular files
+ * can be mapped; a pipe, which might block, is not even written to. */
 char *get_mapfile(cdgen &cx, size_t size);
 
 #endif

@@ -10,40 +10,58 @@
 #include <cstdio>
 #include <cstring>
 #include <exception>
+#include <sys/stat.h>
 #include <unistd.h>
 
 namespace {
 
-constexpr int ending_signals[] = {SIGHUP, SIGINT, SIGQUIT, SIGTERM};
+/* Those that end a program and do not say that it is defective. */
+constexpr int ending_signals[] = {SIGHUP,  SIGINT,    SIGQUIT, SIGTERM, SIGXCPU, SIGALRM,
+                                  SIGPROF, SIGVTALRM, SIGUSR1, SIGUSR2, SIGABRT};
 
 /* A signal handler cannot reach a context, so this is global. */
-std::atomic<const char *> unfinished_output = nullptr;
-static_assert(decltype(unfinished_output)::is_always_lock_free, "handlers may only use what cannot be locked");
+std::atomic<const unfinished_output *> unfinished = nullptr;
+static_assert(decltype(unfinished)::is_always_lock_free, "handlers may only use what cannot be locked");
+
+void remove_unfinished() {
+    if (const unfinished_output *output = unfinished.exchange(nullptr))
+        output->remove();
+}
 
 /* The handler has already been reset, so raising the signal again ends the program by it, as its sender expects. */
-void remove_output(int signal) {
-    if (const char *name = unfinished_output.exchange(nullptr))
-        unlink(name);
+void remove_output(int signal, siginfo_t *, void *) {
+    remove_unfinished();
     raise(signal);
 }
 
 /* The file is another's now, and stays. */
-[[noreturn]] void report_cut_output(int) {
-    constexpr char message[] = "Cannot map CDB file: it was cut while it was written\n";
-    [[maybe_unused]] ssize_t written = write(STDERR_FILENO, message, sizeof message - 1);
+[[noreturn]] void report_cut_output() {
+    const char *pieces[] = {message_of(MSG_CANNOT_MAP).text, CUT_OUTPUT, "\n"};
+    for (const char *piece : pieces)
+        [[maybe_unused]] ssize_t written = write(STDERR_FILENO, piece, strlen(piece));
     _exit(1);
 }
 
-void handle(int signal, void (*handler)(int)) {
+/* Only the system says that there is nothing at an address; other programs may send the signal, too. */
+void meet_bus_error(int signal, siginfo_t *info, void *context) {
+    if (info->si_code == BUS_ADRERR && unfinished != nullptr)
+        report_cut_output();
+    remove_output(signal, info, context);
+}
+
+/* No other signal interrupts the handler, which might otherwise end the program before the output is removed. */
+void handle(int signal, void (*handler)(int, siginfo_t *, void *)) {
     struct sigaction action = {}, before = {};
-    action.sa_handler = handler;
-    action.sa_flags = static_cast<int>(SA_RESETHAND);
+    action.sa_sigaction = handler;
+    action.sa_flags = static_cast<int>(SA_RESETHAND | SA_SIGINFO);
+    sigfillset(&action.sa_mask);
     if (sigaction(signal, &action, &before) == 0 && before.sa_handler == SIG_IGN)
         sigaction(signal, &before, nullptr); /* stays ignored, as under nohup */
 }
 
 /* Called by the standard library when there is no memory even for an exception. */
 [[noreturn]] void end_without_memory() {
+    remove_unfinished();
     fprintf(stderr, "%s%s\n", message_of(MSG_OUT_OF_MEMORY).text, strerror(ENOMEM));
     _exit(ENOMEM);
 }
@@ -56,9 +74,31 @@ void take_process() {
     signal(SIGXFSZ, SIG_IGN);
     for (int signal : ending_signals)
         handle(signal, remove_output);
-    handle(SIGBUS, report_cut_output);
+    handle(SIGBUS, meet_bus_error);
 }
 
-void set_unfinished_output(const char *name) {
-    unfinished_output = name;
+void set_unfinished_output(const unfinished_output *output) {
+    unfinished = output;
+}
+
+bool unfinished_output::has_its_name() const {
+    struct stat st = {};
+    return stat(name, &st) == 0 && st.st_dev == device && st.st_ino == inode;
+}
+
+void unfinished_output::remove() const {
+    if (has_its_name())
+        unlink(name);
+}
+
+held_signals::held_signals() : before() {
+    sigset_t held;
+    sigemptyset(&held);
+    for (int signal : ending_signals)
+        sigaddset(&held, signal);
+    pthread_sigmask(SIG_BLOCK, &held, &before);
+}
+
+held_signals::~held_signals() {
+    pthread_sigmask(SIG_SETMASK, &before, nullptr);
 }

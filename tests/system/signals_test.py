@@ -1,96 +1,118 @@
 """Signals and other programs: what ends cdgen, or cuts its output, leaves no half database.
 
-Every test is a function below, named for what it shows.  strace lets a signal
-arrive at one system call on the output, so that nothing depends on time.  Where
-processes may not be traced, a test is skipped and says why.
+Every test is a function below, named for what it shows.  support/traced.py lets
+a signal arrive at one system call on the output.
 """
 
 import os
-import shutil
 import signal
-import subprocess
-import time
 
-import pytest
+from cases import BEFORE, HEAD, OUT, SOURCE, attributes, check
+from traced import TRACE, continued, ended, ended_by, stopped, struck, traced
 
-from cases import BEFORE, HEAD, OUT, SOURCE, TIMEOUT, attributes, check, expect
-
-ENDING = (signal.SIGHUP, signal.SIGINT, signal.SIGQUIT, signal.SIGTERM)
-TRACE = "trace"
+ENDING = (signal.SIGHUP, signal.SIGINT, signal.SIGQUIT, signal.SIGTERM, signal.SIGXCPU, signal.SIGALRM,
+          signal.SIGVTALRM, signal.SIGPROF, signal.SIGUSR1, signal.SIGUSR2, signal.SIGABRT)
 STAGES = ("ftruncate", "writev", "mmap")  # emptying what was there, filling, mapping
-
-
-def struck(world, call, number, file=OUT, disposition=signal.SIG_DFL):
-    """The program, started to get a signal at a system call on a file; whoever runs the tests may ignore it."""
-    tracer = shutil.which("strace")
-    if tracer is None:
-        pytest.skip("no strace(1) here")
-    world.write(TRACE, b"")
-    options = ["-o", world.path(TRACE), "-P", world.path(file), "-e", f"trace={call}", "-e", f"inject={call}:signal={number}:when=1"]
-    probe = subprocess.run([tracer, "-qq", "-o", "/dev/null", "true"], capture_output=True, check=False)
-    if probe.returncode != 0:
-        pytest.skip("tracing is not allowed here: " + probe.stderr.decode())
-    command = [tracer, *options, world.program, world.path(SOURCE), world.path(OUT)]
-    started = world.options(preexec_fn=lambda: number in ENDING and signal.signal(number, disposition))
-    started["env"]["ASAN_OPTIONS"] = "detect_leaks=0"  # which looks for them by tracing, too
-    return subprocess.Popen(command, stdout=subprocess.PIPE, stderr=subprocess.PIPE, **started)
-
-
-def ended_by(process, number):
-    """Ended by the signal itself, in silence."""
-    streams = process.communicate(timeout=TIMEOUT)
-    check((process.returncode, *streams) == (-number, b"", b""), "expected", -number, "actual", process.returncode, streams)
+CUT = (1, b"", b"Cannot map CDB file: it was cut while it was written\n")
 
 
 def test_before_the_output_is_opened(world):
     """What was there stays."""
     for number in ENDING:
         world.write(OUT, BEFORE)
-        ended_by(struck(world, "read", number, SOURCE), number)
+        ended_by(struck(world, "read", number, file=SOURCE), number)
         check(world.read() == BEFORE, "the output was touched")
+
+
+def test_before_the_output_is_emptied(world):
+    """What was there stays, and no empty file is left where nothing was."""
+    for number in ENDING:
+        for stage in ("openat", "flock"):
+            world.write(OUT, BEFORE)
+            ended_by(struck(world, stage, number), number)
+            check(world.read() == BEFORE, "the output was touched at", stage)
+            world.path(OUT).unlink()
+            ended_by(struck(world, stage, number), number)
+            check(not world.path(OUT).exists(), "an output is left at", stage)
 
 
 def test_while_the_output_is_written(world):
     """The output goes, and the program ends as the signal wants it."""
-    for number in ENDING:
+    for number in (*ENDING, signal.SIGBUS):
         for stage in STAGES:
             world.write(OUT, BEFORE)
             ended_by(struck(world, stage, number), number)
             check(not world.path(OUT).exists(), "an output is left at", stage)
 
 
+def test_two_signals_at_once(world):
+    """The second does not keep the first from removing the output."""
+    world.write(OUT, BEFORE)
+    stats = "%%stat"
+    ended(traced(world, f"{stats},mmap", []))
+    before = world.read(TRACE).split(b"mmap(")[0].count(b"\n")  # calls that look at the output before it is mapped
+    injections = [f"mmap:signal={int(signal.SIGINT)}:when=1", f"{stats}:signal={int(signal.SIGTERM)}:when={before + 1}"]
+    status, *streams = ended(traced(world, f"{stats},mmap", injections))
+    check(status in (-signal.SIGINT, -signal.SIGTERM) and streams == [b"", b""], status, streams)
+    check(b"out.cdef" in world.read(TRACE).split(b"mmap(")[1], "the handler does not look at the output")
+    check(not world.path(OUT).exists(), "an output is left")
+
+
 def test_ignored_ones_stay_ignored(world):
     """As for what goes on in the background when its terminal is closed."""
     good = world.good()
     for number in ENDING:
-        process = struck(world, "mmap", number, disposition=signal.SIG_IGN)
-        streams = process.communicate(timeout=TIMEOUT)
-        expect(subprocess.CompletedProcess([], process.returncode, *streams), 0)
+        actual = ended(struck(world, "mmap", number, disposition=signal.SIG_IGN))
+        check(actual == (0, b"", b""), "expected success, actual", actual)
         check(world.read() == good, "another database")
 
 
-def only_child(process):
-    """The process that a tracer has started."""
-    with open(f"/proc/{process.pid}/task/{process.pid}/children", encoding="ascii") as children:
-        return int(children.read().split()[0])
+def test_bus_error_from_another_program(world):
+    """It is not reported as a file that was cut; without an output, too."""
+    for call, file in (("mmap", OUT), ("read", SOURCE)):
+        process, child = stopped(world, call, file=file)
+        os.kill(child, signal.SIGBUS)
+        actual = continued(process, child)
+        check(actual == (-signal.SIGBUS, b"", b""), "expected", -signal.SIGBUS, "actual", actual)
+        check(not world.path(OUT).exists(), "an output is left")
 
 
-def wait_until_stopped(world, process):
-    """The traced program's number, once the tracer says that it has stopped."""
-    while b"stopped by SIGSTOP" not in world.read(TRACE):
-        check(process.poll() is None, "ended before it was stopped:", process.returncode)
-        time.sleep(0.001)
-    return only_child(process)
+def test_uncatchable_signal_leaves_no_lock(world):
+    """What it leaves is replaced by the next compilation."""
+    good = world.good()
+    ended_by(struck(world, "mmap", signal.SIGKILL), signal.SIGKILL)
+    check(world.path(OUT).exists(), "the case is void")
+    check(world.run().returncode == 0 and world.read() == good, "another database")
 
 
-def test_output_cut_by_another_program(world):
-    """A message and a status; the file is the other program's."""
-    world.write(SOURCE, HEAD + attributes(1000))
-    process = struck(world, "mmap", signal.SIGSTOP)
-    child = wait_until_stopped(world, process)
-    world.path(OUT).write_bytes(b"other")
-    os.kill(child, signal.SIGCONT)
-    streams = process.communicate(timeout=TIMEOUT)
-    expect(subprocess.CompletedProcess([], process.returncode, *streams), 1,
-           b"Cannot map CDB file: it was cut while it was written\n")
-    check(world.path(OUT).stat().st_size < 8192, "the output was written")
+def cut_at(world, call, contents):
+    """What becomes of an output that another program writes anew, just after a system call."""
+    process, child = stopped(world, call)
+    world.path(OUT).write_bytes(contents)
+    check(continued(process, child) == CUT, "not refused")
+    return world.read()
+
+
+def test_output_cut_before_it_is_mapped(world):
+    """Shorter than it was filled, be it by a page or by a few bytes: the file is the other program's."""
+    for source in (HEAD, HEAD + attributes(1000)):
+        world.write(SOURCE, source)
+        for contents in (b"", b"other", b"other" * 150):
+            check(cut_at(world, "writev", contents) == contents, "the output was written")
+
+
+def test_output_cut_after_it_is_mapped(world):
+    """A message and a status; the file keeps its size."""
+    for source in (HEAD, HEAD + attributes(1000)):
+        world.write(SOURCE, source)
+        for contents in (b"", b"other"):
+            check(len(cut_at(world, "mmap", contents)) == len(contents), "the output was written")
+
+
+def test_output_grown_before_it_is_mapped(world):
+    """What is too much is cut off again."""
+    good = world.good(HEAD + attributes(100))
+    process, child = stopped(world, "writev")
+    os.truncate(world.path(OUT), 100000)
+    check(continued(process, child) == (0, b"", b""), "not compiled")
+    check(world.read() == good, "another database")

@@ -10,6 +10,7 @@
 #include <filesystem>
 #include <fstream>
 #include <functional>
+#include <sys/file.h>
 #include <sys/mman.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
@@ -466,6 +467,13 @@ protected:
         return fatal_message([this] { bld_cdb(cx); });
     }
 
+    /* The output as it is now, as one that is being written. */
+    unfinished_output begun() const {
+        struct stat st = {};
+        EXPECT_EQ(stat(output.c_str(), &st), 0);
+        return {output.c_str(), st.st_dev, st.st_ino};
+    }
+
     image contents() const {
         std::ifstream in(output, std::ios::binary);
         image read(0);
@@ -786,10 +794,49 @@ TEST_F(ImageFile, ThatIsMappedGoesWithTheContext) {
     write_output(std::string(1024, 'x'));
     {
         cdgen mapped;
-        mapped.output.name = output.c_str();
         mapped.output.cdb_mapfile_fd = dup(STDERR_FILENO);
+        mapped.output.begun = begun();
     }
     EXPECT_FALSE(std::filesystem::exists(output));
+}
+
+TEST_F(ImageFile, OfAnotherThatTookTheNameStays) {
+    write_output("ours");
+    unfinished_output ours = begun();
+    EXPECT_TRUE(ours.has_its_name());
+    std::filesystem::rename(output, directory / "moved");
+    EXPECT_FALSE(ours.has_its_name());
+    ours.remove();
+    write_output("another's");
+    EXPECT_FALSE(ours.has_its_name());
+    ours.remove();
+    EXPECT_TRUE(std::filesystem::exists(output));
+    std::filesystem::rename(directory / "moved", output);
+    ours.remove();
+    EXPECT_FALSE(std::filesystem::exists(output));
+}
+
+/* ---- Locks ----------------------------------------------------------------------------------------------------- */
+
+TEST_F(ImageFile, ThatIsLockedIsRefusedAndStays) {
+    add_least();
+    write_output("yesterday's");
+    int other = open(output.c_str(), O_RDONLY | O_CLOEXEC);
+    ASSERT_EQ(flock(other, LOCK_SH | LOCK_NB), 0);
+    EXPECT_EQ(build(), "Cannot create CDB file: another program has locked it");
+    EXPECT_EQ(std::string(contents().at(0), 11), "yesterday's");
+    close(other);
+    EXPECT_EQ(build(), "none");
+}
+
+TEST_F(ImageFile, IsNotLockedOnceItIsFinishedOrRemoved) {
+    add_least();
+    for (int n = 0; n < 2; ++n)
+        ASSERT_EQ(build(), "none");
+    cdgen none;
+    none.options.cdefname = output.c_str();
+    EXPECT_EQ(fatal_message([&] { bld_cdb(none); }), "No Rsrc Class Tables found");
+    EXPECT_EQ(build(), "none");
 }
 
 } // namespace

@@ -6,6 +6,7 @@
 #include <gtest/gtest.h>
 
 #include <cerrno>
+#include <csignal>
 #include <cstdio>
 #include <exception>
 #include <filesystem>
@@ -74,6 +75,37 @@ TEST(Process, WithoutMemoryEndsWithTheSystemsStatus) {
     };
     EXPECT_EXIT(take_and_terminate(), testing::ExitedWithCode(ENOMEM),
                 "^cfg_malloc malloc failure: Cannot allocate memory\n$");
+}
+
+TEST_F(Context, EndWithoutMemoryRemovesAnUnfinishedOutput) {
+    std::filesystem::path output = directory / "unfinished.cdef";
+    std::ofstream(output) << "half";
+    struct stat st = {};
+    ASSERT_EQ(stat(output.c_str(), &st), 0);
+    unfinished_output begun = {output.c_str(), st.st_dev, st.st_ino};
+    auto begin_and_terminate = [&begun] {
+        take_process();
+        set_unfinished_output(&begun);
+        std::terminate();
+    };
+    EXPECT_EXIT(begin_and_terminate(), testing::ExitedWithCode(ENOMEM), "");
+    EXPECT_FALSE(std::filesystem::exists(output));
+}
+
+/* Each of them is delivered at the end of the block, and not before. */
+TEST(Process, SignalsAreHeldUntilTheEndOfTheBlock) {
+    static volatile sig_atomic_t received;
+    for (int signal : {SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGXCPU, SIGALRM, SIGVTALRM, SIGPROF, SIGUSR1, SIGUSR2}) {
+        received = 0;
+        auto before = std::signal(signal, [](int) { received = 1; });
+        {
+            held_signals held;
+            raise(signal);
+            EXPECT_EQ(received, 0) << signal;
+        }
+        EXPECT_EQ(received, 1) << signal;
+        std::signal(signal, before);
+    }
 }
 
 } // namespace

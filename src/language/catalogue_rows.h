@@ -133,9 +133,10 @@ constexpr vx_uint32_t required_mask(std::span<const table_attrs> attrs) {
     return mask;
 }
 
-/* Deliberate: 0x20 and 0x40 belong to no attribute, so that no ActionOut element is ever complete and none takes an
+/* Deliberate: these bits belong to no attribute, so that no ActionOut element is ever complete and none takes an
  * optional attribute. */
-inline constexpr vx_uint32_t ACTION_OUT_MASK = required_mask(sd_attrs) | 0x20 | 0x40;
+inline constexpr vx_uint32_t BITS_OF_NO_ATTRIBUTE = 0x20 | 0x40;
+inline constexpr vx_uint32_t ACTION_OUT_MASK = required_mask(sd_attrs) | BITS_OF_NO_ATTRIBUTE;
 
 #define ATTR_KIND(record, sd_attr_type, value)                                                                         \
     attr_kind {                                                                                                        \

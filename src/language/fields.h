@@ -5,17 +5,59 @@
 #include "format/records.h"
 #include "language/catalogue.h"
 
+#include <algorithm>
+
 namespace language {
 
 /* The record that a stanza fills; for structured data, the one element that is staged at a time. */
-const cdb::record_format &record_of(const srtable_ctrl &stanza);
+constexpr const cdb::record_format &record_of(const srtable_ctrl &stanza) {
+    switch (stanza.sc_record) {
+    case STAGED_CLASS:
+        return cdb::format_for<rsrc_class_t>;
+    case STAGED_CMMAP:
+        return cdb::format_for<rsrc_cmmap_t>;
+    case STAGED_VARIABLE_CLASS:
+        return cdb::format_for<rsrc_variable_class_t>;
+    case STAGED_PATTR:
+    case STAGED_PATTR_C:
+        return cdb::format_for<rsrc_pattr_t>;
+    case STAGED_DATTR:
+    case STAGED_DATTR_C:
+        return cdb::format_for<rsrc_dattr_t>;
+    case STAGED_ACTION:
+    case STAGED_ACTION_C:
+        return cdb::format_for<rsrc_action_t>;
+    case STAGED_SD_DEF:
+    case STAGED_COUNT:
+        break;
+    }
+    return cdb::format_for<sd_field_t>;
+}
 
 /* Its offset in what is staged, from which the catalogue's offsets count; in bytes. */
-std::size_t record_start(const srtable_ctrl &stanza);
+constexpr std::size_t record_start(const srtable_ctrl &stanza) {
+    return stanza.sc_record == STAGED_SD_DEF ? offsetof(sd_def_t, sd_fields) : 0;
+}
 
 /* Whether the attribute's lines fill the field of this row. An attribute that is only checked, refused or ignored names
  * a field that it does not fill. */
-bool fills(const table_attrs &attribute, const cdb::field_fact &row);
+constexpr bool fills(const table_attrs &attribute, const cdb::field_fact &row) {
+    std::string_view name(attribute.ta_name, attribute.ta_length);
+    std::string_view rest = row.lines;
+    while (!rest.empty()) {
+        std::string_view line = rest.substr(0, rest.find(' '));
+        if (line == name)
+            return true;
+        rest.remove_prefix(std::min(rest.size(), line.size() + 1));
+    }
+    return false;
+}
+
+/* Whether an attribute stores nothing in the field that it names: it is checked only, or refused, or ignored. */
+constexpr bool stores_nothing(const table_attrs &attribute) {
+    return attribute.ta_type == AT_SD_INDEX || attribute.ta_type == AT_SD_DEFAULT_VALUE ||
+           attribute.ta_type == AT_LIST_ACTION_CLASS || attribute.ta_type == AT_LIST_ACTION_RSRC;
+}
 
 } // namespace language
 

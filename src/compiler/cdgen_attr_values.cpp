@@ -222,10 +222,10 @@ bool is_sd(vx_data_type_t type) {
     return scalar_vx(type) == VX_SD_PTR;
 }
 
-std::shared_ptr<dflt_values> new_dflt_values(cdgen &cx, const char *name) {
+std::shared_ptr<dflt_values> new_dflt_values(cdgen &cx, const char *name, vx_data_type_t sd_type = VX_UNKNOWN) {
     if (cx.framing.spare_dflt == nullptr)
-        return std::make_shared<dflt_values>(name);
-    cx.framing.spare_dflt->restart(name);
+        return std::make_shared<dflt_values>(name, sd_type);
+    cx.framing.spare_dflt->restart(name, sd_type);
     return std::move(cx.framing.spare_dflt);
 }
 
@@ -253,7 +253,7 @@ void expect_sd_run(const attr_line &line, vx_data_type_t type) {
     cx.sd.announce(reinterpret_cast<vx_value_t *>(line.record + kind.value_offset),
                    reinterpret_cast<cdb_ref_t *>(line.record + kind.sd_offset),
                    reinterpret_cast<vx_uint16_t *>(line.record + kind.max_sd_idx_offset), kind.sd_attr_type);
-    line.state.dflt.tbl = new_dflt_values(cx, type == VX_SD_PTR ? "VX_SD_PTR" : "VX_SD_PTR_ARRAY");
+    line.state.dflt.tbl = new_dflt_values(cx, type == VX_SD_PTR ? "VX_SD_PTR" : "VX_SD_PTR_ARRAY", type);
 }
 
 void store_data_type(const attr_line &line) {

@@ -11,16 +11,18 @@
 /* Values that wait for their attribute to be completed: one 8-byte cell each, for an SD-typed attribute the types of
  * its elements. */
 struct dflt_values {
-    dflt_values(const char *name) : cells(32, name) {}
+    dflt_values(const char *name, vx_data_type_t type = VX_UNKNOWN) : cells(32, name), sd_type(type) {}
 
     /* Empty, as if new, except that memory is reused. */
-    void restart(const char *name) {
+    void restart(const char *name, vx_data_type_t type = VX_UNKNOWN) {
         cells.restart(name);
         texts.clear();
+        sd_type = type;
     }
 
     struct tbl cells;
-    text_pool texts; /* what the cells point at */
+    text_pool texts;        /* what the cells point at */
+    vx_data_type_t sd_type; /* of an SD-typed attribute: its type, VX_SD_PTR or VX_SD_PTR_ARRAY; or unknown */
 };
 
 /* The list is shared by an SD-typed attribute's stanza and the SD stanzas that follow it. */

@@ -47,10 +47,9 @@ void file_element(cdgen &cx) {
 /* The attribute's value is one of the defaults of the run's element types. */
 void dump_sd_default(cdgen &cx, const srtable_ctrl *scp) {
     dflt_tbl &dflt = cx.framing.stanzas[static_cast<size_t>(scp - sc_tables.data())].dflt;
-    bool scalar = strcmp(dflt.tbl->cells.tbl_name, "VX_SD_PTR") == 0;
     dflt.num_elems = cx.sd.sd_num_elems;
     dump_dflt(cx, staged_tbl(cx.staged.cb_rsrc_class.u_rc_strings), &dflt, cx.sd.attr_dflt_val,
-              scalar ? VX_SD_PTR : VX_SD_PTR_ARRAY);
+              dflt.tbl->sd_type == VX_SD_PTR ? VX_SD_PTR : VX_SD_PTR_ARRAY);
 }
 
 /* One element's default into the structured value in the making. */

@@ -315,6 +315,7 @@ TEST(DataType, StructuredDataAwaitTheirRun) {
             EXPECT_EQ(c.cx.sd.sd_attr_type, dynamic ? 1 : 0);
             const tbl &types = c.state(kind).dflt.tbl->cells;
             EXPECT_STREQ(types.tbl_name, std::string(name) == "SD" ? "VX_SD_PTR" : "VX_SD_PTR_ARRAY");
+            EXPECT_EQ(c.state(kind).dflt.tbl->sd_type, std::string(name) == "SD" ? VX_SD_PTR : VX_SD_PTR_ARRAY);
             EXPECT_EQ(types.tbl_au, 32U);
             EXPECT_EQ(types.used(), 0U);
         }
@@ -343,6 +344,7 @@ TEST(DefaultValue, ValuesAreCollectedInTheirOrder) {
                 const dflt_tbl &values = c.state(kind).dflt;
                 EXPECT_EQ(values.num_elems, 2U);
                 EXPECT_STREQ(values.tbl->cells.tbl_name, "DefaultValues");
+                EXPECT_EQ(values.tbl->sd_type, VX_UNKNOWN);
                 EXPECT_EQ(values.tbl->cells.tbl_au, 32U);
                 auto cells = records_of<vx_value_t>(&values.tbl->cells);
                 ASSERT_EQ(cells.size(), 2U);

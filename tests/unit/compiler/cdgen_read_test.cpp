@@ -342,7 +342,7 @@ TEST(Reader, AttributeRunTakesOverTheAttributesCollection) {
 
 TEST(Reader, PlainRunStartsWithoutACollection) {
     compilation c;
-    c.cx.framing.stanzas[SC_RESET_SD_DEFINITION].dflt = {std::make_shared<dflt_values>("VX_SD_PTR"), 7};
+    c.cx.framing.stanzas[SC_RESET_SD_DEFINITION].dflt = {std::make_shared<dflt_values>("VX_SD_PTR", VX_SD_PTR), 7};
     c.read(CLASS + "ResetSDDefinition\n");
     EXPECT_EQ(c.cx.framing.stanzas[SC_RESET_SD_DEFINITION].dflt.tbl, nullptr);
     EXPECT_EQ(c.cx.framing.stanzas[SC_RESET_SD_DEFINITION].dflt.num_elems, 0U);

@@ -46,7 +46,7 @@ void forget_values(cdgen &cx, dflt_tbl &dflt) {
 }
 
 void begin_sd_stanza(cdgen &cx) {
-    bool of_attribute = is_attr_SD(cx.framing.table_id) != nullptr;
+    bool of_attribute = cx.framing.scp->sc_sd_owner->is_attribute();
     stanza_state &state = state_of(cx, cx.framing.scp);
     if (cx.staged.cb_sd_def.sd_cb_ID != 0 && cx.framing.prev_scp != cx.framing.scp) {
         cmplt_sd_tbl(cx, cx.framing.prev_scp);

@@ -302,13 +302,6 @@ int oct_convert(cdgen &cx, const char *p, int type, char *out_buf) {
     return 0;
 }
 
-char *strip_quotes(char *s) {
-    if (s == nullptr)
-        return nullptr;
-    char *end = s + strlen(s);
-    return strip_quotes(s, &end);
-}
-
 char *strip_quotes(char *s, char **end) {
     char *open = s;
     while (*open == ' ' || *open == '\t')

@@ -35,9 +35,7 @@ int str_to_vx(cdgen &cx, vx_value_t *vx_out, vx_data_type_t vx_type, const char 
 int hex_convert(char *vx_out, const char *str_in);
 int oct_convert(cdgen &cx, const char *p, int type, char *out_buf);
 /* The text inside a pair of double quotes; s itself when it is not quoted; null when the quotes do not match. Writes a
- * NUL over the closing quote. */
-char *strip_quotes(char *s);
-/* The same for a text that is known to end, with a NUL, at *end, which becomes the end of what is returned. */
+ * NUL over the closing quote. The text must end, with a NUL, at *end, which becomes the end of what is returned. */
 char *strip_quotes(char *s, char **end);
 /* ORs the bits of the properties named in a comma-separated list, which it takes apart, into *dest. An unknown name is
  * fatal. */

@@ -28,8 +28,19 @@ void del_tbl_entry(cdgen &cx, const rsrc_variable_class_t *rvcp) {
             cx.variable_ids.tbl_entries[i] = {};
 }
 
+const char *is_attr_SD(int table_id) {
+    return strstr(sc_tables[static_cast<size_t>(table_id)].sc_name, "AttrSDDefinition");
+}
+
 const char *is_SD_stanza(int table_id) {
     return strstr(sc_tables[static_cast<size_t>(table_id)].sc_name, "SDDefinition");
+}
+
+char *strip_quotes(char *s) {
+    if (s == nullptr)
+        return nullptr;
+    char *end = s + strlen(s);
+    return strip_quotes(s, &end);
 }
 
 sd_type_t SD_stanza_type(int table_id) {

@@ -4,25 +4,36 @@
 
 #include "compiler/cdgen_context.h"
 
-/* Copies len bytes and zeroes on to the next multiple of 8, for which dst must have room. */
+/* Copies len bytes and zeroes on to the next multiple of 8, for which dst must have room. It is laid down, and nothing
+ * calls it. */
 void memcpy_8_rounded(char *dst, const char *src, int len);
 
-/* An empty structured value in a table of default values, for an SD type. */
+/* Appends an empty structured value of an SD type to a table of default values. It is laid down, and nothing calls it.
+ */
 vx_uint32_t mk_sd_data_tbl(cdgen &cx, vx_data_type_t sd_type, tbl *dflt_tp);
 
-/* Takes a variable class's list of variable IDs out of the pairs. */
+/* Removes a variable class's list of variable IDs from the pairs. It is laid down, and nothing calls it. */
 void del_tbl_entry(cdgen &cx, const rsrc_variable_class_t *rvcp);
 
-/* Non-null when the kind's name says that it defines structured data. */
+/* Non-null when the kind's name says that it defines structured data. It is laid down, and nothing calls it: the
+ * catalogue has the owner of each kind's structured data. */
 const char *is_SD_stanza(int table_id);
 
-/* What the kind's structured data belong to. */
+/* Non-null when the kind's name says that it defines structured data of an attribute. It is laid down, and nothing
+ * calls it: sd_owner::is_attribute() answers. */
+const char *is_attr_SD(int table_id);
+
+/* The owner of the kind's structured data. It is laid down, and nothing calls it. */
 sd_type_t SD_stanza_type(int table_id);
 
-/* The table for the elements of the kind's stanzas; null if it has none. */
+/* The table for the elements of the kind's stanzas; null if it has none. It is laid down, and nothing calls it. */
 tbl *sc_sd_tbl(cdgen &cx, const srtable_ctrl &kind);
 
-/* Takes one attribute line, il, without comment and newline, apart in place. */
+/* Takes one attribute line, il, without comment and newline, apart in place. It is laid down, and nothing calls it. */
 void save_attr(cdgen &cx, char *il, int table_id);
+
+/* The text inside a pair of double quotes, as the other strip_quotes finds it; null for null. It is laid down, and
+ * nothing calls it. */
+char *strip_quotes(char *s);
 
 #endif

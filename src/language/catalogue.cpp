@@ -79,7 +79,3 @@ const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name) {
     return name.size() == attr.ta_length && std::memcmp(name.data(), attr.ta_name, attr.ta_length) == 0 ? &attr
                                                                                                         : nullptr;
 }
-
-const char *is_attr_SD(int table_id) {
-    return std::strstr(sc_tables[static_cast<std::size_t>(table_id)].sc_name, "AttrSDDefinition");
-}

@@ -107,6 +107,10 @@ struct sd_owner {
     sd_type_t type;
     cdb_ref_t rsrc_class_t::*of_class;
     cdb_ref_t rsrc_action_t::*of_action;
+
+    bool is_attribute() const {
+        return type == SD_TYPE_PATTR || type == SD_TYPE_DATTR;
+    }
 };
 
 /* The record that a stanza fills. */
@@ -151,7 +155,5 @@ extern const std::array<srtable_ctrl, SC_COUNT + 1> sc_tables;
 int set_table_id(const char *name);
 /* A kind's attribute by its exact name, or null. */
 const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name);
-/* Non-null when the kind's name says that it defines structured data of an attribute. */
-const char *is_attr_SD(int table_id);
 
 #endif

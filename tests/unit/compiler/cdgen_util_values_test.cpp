@@ -1,5 +1,6 @@
 /* Data types by name, and from text to values. */
 
+#include "compiler/given_interface.h"
 #include "compiler/util_fixture.h"
 
 #include <cerrno>

@@ -2,6 +2,7 @@
 
 #include "check/compilation.h"
 
+#include "language/catalogue_rows.h"
 #include "language/names.h"
 
 namespace check {
@@ -18,8 +19,7 @@ language::name_list compilation::missing(int kind) const {
 }
 
 bool compilation::has_index(int kind) const {
-    constexpr vx_uint32_t ELEMENT_INDEX_BIT = 0x8; /* in an SD kind's req_mask */
-    return (required_seen(kind) & ELEMENT_INDEX_BIT) != 0;
+    return (required_seen(kind) & language::bit_of("ElementIndex")) != 0;
 }
 
 } // namespace check

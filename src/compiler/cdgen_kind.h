@@ -4,11 +4,10 @@
 
 #include "compiler/cdgen_context.h"
 #include "compiler/cdgen_kinds.h"
+#include "language/catalogue_rows.h"
 
 constexpr vx_uint16_t NO_SD_IDX = 0xFFFF;
 constexpr vx_uint16_t NO_GROUP = 255;
-constexpr vx_uint32_t GROUP_ID_BIT = OPTIONAL | 0x1;
-constexpr vx_uint32_t GROUP_NAME_BIT = OPTIONAL | 0x2;
 
 /* "None" while staged. */
 inline void mark_absent(cdb_ref_t &ref) {
@@ -42,9 +41,9 @@ template <class Attribute> void settle_valid_vals(Attribute &attr, vx_uint16_t &
 }
 
 template <class Attribute> void settle_group(Attribute &attr, const stanza_state &state) {
-    if (!was_given(state, GROUP_ID_BIT))
+    if (!was_given(state, language::bit_of("GroupID")))
         attr.ra_group_id = NO_GROUP;
-    if (!was_given(state, GROUP_NAME_BIT))
+    if (!was_given(state, language::bit_of("GroupName")))
         attr.ra_group_msgid = 0;
 }
 

@@ -4,7 +4,6 @@
 
 namespace {
 
-constexpr vx_uint32_t PERMISSION_BIT = OPTIONAL | 0x4;
 constexpr vx_uint32_t DEFAULT_PERMISSION = 0x40; /* letter s */
 
 /* What sets the two kinds apart. */
@@ -27,7 +26,7 @@ void complete_action(cdgen &cx, const action_kind &kind) {
         rsrc_action_t &action = cx.staged.*kind.record;
         require_class(cx, NO_CLASS);
         require_complete(cx, kind.id);
-        if (!was_given(cx.framing.stanzas[kind.id], PERMISSION_BIT))
+        if (!was_given(cx.framing.stanzas[kind.id], language::bit_of("Permission")))
             action.ac_perms = DEFAULT_PERMISSION;
         append_record(cx, staged_tbl(cx.staged.cb_rsrc_class.*kind.records), action);
         action.ac_cb_ID = 0;

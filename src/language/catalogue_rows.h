@@ -218,4 +218,24 @@ inline constexpr std::array<srtable_ctrl, SC_COUNT + 1> catalogue = {{
 
 } // namespace language::rows
 
+namespace language {
+
+/* The bit of an attribute, as req_bit has it. Does not compile unless a kind has the attribute, and every kind that has
+ * it gives it the same bit. */
+consteval vx_uint32_t bit_of(std::string_view attribute) {
+    vx_uint32_t bit = 0;
+    for (const srtable_ctrl &stanza : rows::catalogue)
+        for (const table_attrs &attr : stanza.sc_attrs)
+            if (attr.ta_name == attribute) {
+                if (bit != 0 && bit != attr.req_bit)
+                    throw "kinds differ in the bit of this attribute";
+                bit = attr.req_bit;
+            }
+    if (bit == 0)
+        throw "no kind has this attribute";
+    return bit;
+}
+
+} // namespace language
+
 #endif

@@ -2,6 +2,8 @@
 
 #include "language/names.h"
 
+#include "language/catalogue_rows.h"
+
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -44,6 +46,13 @@ TEST(MissingNames, AreRequiredAndNotSeen) {
     EXPECT_EQ(language::missing_names(map_kind(), 0), all);
     EXPECT_EQ(language::missing_names(map_kind(), map_kind().sc_attrs[0].req_bit).size(), 4u);
     EXPECT_EQ(language::missing_names(map_kind(), map_kind().req_mask_cmplt), name_list());
+}
+
+TEST(BitOf, IsTheOneThatEveryKindGivesTheAttribute) {
+    EXPECT_EQ(language::bit_of("GroupID"), OPTIONAL | 0x1);
+    EXPECT_EQ(language::bit_of("GroupName"), OPTIONAL | 0x2);
+    EXPECT_EQ(language::bit_of("Permission"), OPTIONAL | 0x4);
+    EXPECT_EQ(language::bit_of("ElementIndex"), 0x8u);
 }
 
 } // namespace

@@ -31,8 +31,8 @@ constexpr message table[] = {
      "Close the quote at the end of the value; only a comment may follow it."},
     /* Deliberately spelled so, as MSG_INDEX_NOT_CONSECUTIVE is. */
     {MSG_VALUE_TOO_LONG, "S105", "Attibute value exceeds maximum length: ", FIRST, mark_kind::value, blame::source,
-     "A value has more than 1797 characters. A source line cannot hold that many, so a check never "
-     "reports this.",
+     "A value has more than 1797 characters. A source line cannot hold that many, so no source "
+     "causes this.",
      "Shorten the value."},
     {MSG_UNKNOWN_ATTRIBUTE, "S106", "Attribute name not defined in table (name/table): ", FIRST, mark_kind::name,
      blame::source,
@@ -106,7 +106,7 @@ constexpr message table[] = {
      blame::source, "An element has a `DefaultValue`.", "Remove it: an element has the default of its type."},
     {MSG_SECOND_MANAGER, "S213", "Resource manager already defined: ", FIRST, mark_kind::value, blame::source,
      "`ResourceManager` is given a second time; the first name follows. Within one stanza that is S109, "
-     "and a second stanza is S118, so a check never reports this.",
+     "and a second stanza is S118, so no source causes this.",
      "Remove one of the two."},
     {MSG_SBS_TYPE, "S214", "VX_SBS_TYPE not supported", FIRST, mark_kind::none, blame::source,
      "An attribute, or an element of one, is of type `SBS`.", "Choose another type."},
@@ -135,28 +135,22 @@ constexpr message table[] = {
     {MSG_TABLE_TOO_LARGE, "S307", "A table or section is too large for the database (4294967295 bytes at most)", FIRST,
      mark_kind::none, blame::source, "An offset would not fit in 32 bits.", "Make the class smaller."},
     {MSG_INVALID_OUTPUT_NAME, "S308", "Invalid cdef out file name (must end in .cdef)", FIRST, mark_kind::none,
-     blame::source,
-     "The class has no `Name`, and the output file's name does not contain `.cdef`. A check never reports "
-     "this.",
+     blame::source, "The class has no `Name`, and the output file's name does not contain `.cdef`.",
      "Give the class a `Name`."},
 
     /* Files, memory, the command line */
-    {MSG_USAGE, "S801", "Usage: ", FIRST, mark_kind::none, blame::surroundings,
-     "cdgen was given no file names. A check never reports this.", "Name the source and the database."},
+    {MSG_USAGE, "S801", "Usage: ", FIRST, mark_kind::none, blame::surroundings, "cdgen was given no file names.",
+     "Name the source and the database."},
     {MSG_USAGE_NO_OUTPUT, "S802", "usage: ", FIRST, mark_kind::none, blame::surroundings,
-     "cdgen was given only one file name. A check never reports this.", "Name the database too."},
+     "cdgen was given only one file name.", "Name the database too."},
     {MSG_CANNOT_OPEN, "S803", ": cannot open because: ", AFTER_ITEM, mark_kind::none, blame::surroundings,
-     "The source cannot be opened. A check reports it without the code, continues with its other sources, "
-     "and ends with status 2.",
-     "See the system's reason after the text."},
+     "The source cannot be opened.", "See the system's reason after the text."},
     {MSG_CANNOT_READ, "S804", ": cannot read because: ", AFTER_ITEM, mark_kind::none, blame::surroundings,
-     "The source is a directory or cannot be read to its end; reported as S803 is.",
-     "See the system's reason after the text."},
+     "The source is a directory or cannot be read to its end.", "See the system's reason after the text."},
     {MSG_CANNOT_CREATE, "S805", "Cannot create CDB file: ", FIRST, mark_kind::none, blame::surroundings,
-     "The database cannot be created or filled. A check never reports this.",
-     "See the system's reason after the text."},
+     "The database cannot be created or filled.", "See the system's reason after the text."},
     {MSG_CANNOT_MAP, "S806", "Cannot map CDB file: ", FIRST, mark_kind::none, blame::surroundings,
-     "The database cannot be mapped. A check never reports this.", "Write it to a regular file."},
+     "The database cannot be mapped.", "Write it to a regular file."},
     {MSG_OUT_OF_MEMORY, "S807", "cfg_malloc malloc failure: ", FIRST, mark_kind::none, blame::surroundings,
      "Memory ran out.", "Make the class smaller, or give the process more memory."},
     {MSG_NO_MEMORY_FOR_TABLE, "S808", ": alloc_tble malloc failure: ", AFTER_ITEM, mark_kind::none, blame::surroundings,

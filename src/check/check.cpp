@@ -13,8 +13,8 @@ namespace check {
 namespace {
 
 /* One check of one source, whose name must stay as long. */
-struct session {
-    session(const std::string &name, const warning_set &wanted) : compiler(name.c_str()), warned(wanted, found) {}
+struct source_check {
+    source_check(const std::string &name, const warning_set &wanted) : compiler(name.c_str()), warned(wanted, found) {}
 
     totals run(const sink &to);
     void take(const source_line &source);
@@ -28,7 +28,7 @@ struct session {
     recovery recover = {compiler, line, known, found, see, warned};
 };
 
-void session::take(const source_line &source) {
+void source_check::take(const source_line &source) {
     line.read(source, compiler.line_number());
     warned.line(see);
     source_line stripped = source;
@@ -43,7 +43,7 @@ void session::take(const source_line &source) {
         recover.take_attribute();
 }
 
-totals session::run(const sink &to) {
+totals source_check::run(const sink &to) {
     for (;;) {
         source_line source = compiler.next_line();
         if (source.begin == nullptr)
@@ -59,13 +59,13 @@ totals session::run(const sink &to) {
 } // namespace
 
 totals check_bytes(std::string_view bytes, const std::string &name, const warning_set &wanted, const sink &to) {
-    auto one = std::make_unique<session>(name, wanted);
+    auto one = std::make_unique<source_check>(name, wanted);
     one->compiler.open_bytes(bytes);
     return one->run(to);
 }
 
 totals check_file(const std::string &path, const warning_set &wanted, const sink &to) {
-    auto one = std::make_unique<session>(path, wanted);
+    auto one = std::make_unique<source_check>(path, wanted);
     try {
         if (path == "-") /* by its descriptor: it may not be a file, or be half read */
             one->compiler.open(fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));

@@ -202,7 +202,7 @@ void recovery::recover_value(const fatal_exit &failure, bool consequence) {
         recover_index(consequence);
     }
     if (failure.id == MSG_NO_STRING_TABLE)
-        forge_class();
+        open_placeholder_class();
     if (is_sd_kind(known.kind) && failure.id == MSG_INVALID_VALUE && compiler.data_type() == VX_UNKNOWN)
         report_type_here();
 }

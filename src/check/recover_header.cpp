@@ -103,7 +103,7 @@ void recovery::open_stanza(int kind, bool broken) {
 
 /* Whether the header is to be tried again. */
 bool recovery::recover_header(const fatal_exit &failure, int kind) {
-    if (failure.completing >= 0)
+    if (failure.record >= 0)
         return recover_completion(failure);
     if (!compiler.class_is_open() && wants_class(failure.id))
         return recover_missing_class(failure, kind);
@@ -135,14 +135,14 @@ bool recovery::recover_missing_class(const fatal_exit &failure, int kind) {
     if (!known.lost.may_be(SC_CONTROL_DEFINITION))
         report_with_notes(failure, line.all(), kind);
     header_reported = true;
-    forge_class();
+    open_placeholder_class();
     return true;
 }
 
 /* The elements are checked although they belong to nothing. */
 void recovery::begin_stray_run(int kind) {
-    forge_class();
-    compiler.begin_run_of_nobody(kind);
+    open_placeholder_class();
+    compiler.begin_ownerless_run(kind);
     open_stanza(kind, true);
     known.stanza().misplaced = true;
     index_lost = true;

@@ -56,7 +56,7 @@ bool recovery::is_reported_otherwise(const fatal_exit &failure) const {
 
 /* The kind whose completion failed. */
 int recovery::failed_kind(const fatal_exit &failure) const {
-    int kind = failure.completing;
+    int kind = failure.record;
     return kind >= 0 && is_sd_kind(kind) ? known.run.kind : kind;
 }
 
@@ -69,8 +69,8 @@ void recovery::end_stanza(int next_kind) {
 }
 
 /* Stanzas before the class, or without any, are checked in a class of their own. */
-void recovery::forge_class() {
-    if (compiler.forge_class())
+void recovery::open_placeholder_class() {
+    if (compiler.open_placeholder_class())
         known.class_forged = true;
 }
 

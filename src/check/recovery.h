@@ -40,7 +40,7 @@ private:
 
     /* Stanzas and records (recovery.cpp). */
     void end_stanza(int next_kind);
-    void forge_class();
+    void open_placeholder_class();
     void drop_record(int kind);
     void abandon(int kind, const fatal_exit &failure);
     void settle_broken(int next_kind);

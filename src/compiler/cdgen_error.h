@@ -17,8 +17,9 @@ struct fatal_exit {
     int line; /* 0: none */
     int code; /* exit status */
 
-    /* The stanza_id of the record whose completion failed, -1 if that did not; all structured data have one. */
-    int completing = -1;
+    /* The stanza_id of the stanza whose record could not be completed, -1 if something else failed. All structured data
+     * have the same one. */
+    int record = -1;
 };
 
 /* The message and its details in the order in which they are printed, without separators; none is null. There must be a
@@ -38,7 +39,7 @@ template <class Complete> void completing(int kind, Complete complete) {
     try {
         complete();
     } catch (fatal_exit &failure) {
-        failure.completing = kind;
+        failure.record = kind;
         throw;
     }
 }

@@ -97,7 +97,7 @@ vx_data_type_t stepwise_compiler::data_type() const {
 
 /* ---- Recoveries ------------------------------------------------------------------------------------------------ */
 
-bool stepwise_compiler::forge_class() {
+bool stepwise_compiler::open_placeholder_class() {
     if (class_is_open())
         return false;
     init_class_tbl(cx);
@@ -118,7 +118,7 @@ void stepwise_compiler::give_up_run() {
     cx.sd.give_up();
 }
 
-void stepwise_compiler::begin_run_of_nobody(int kind) {
+void stepwise_compiler::begin_ownerless_run(int kind) {
     cx.sd.begin_for(nobody, mk_sd_sec(cx));
     cx.framing.scp = cx.framing.curr_sd_scp = &row_of(kind);
     cx.framing.state = &cx.framing.stanzas[static_cast<size_t>(kind)];

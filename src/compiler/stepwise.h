@@ -75,8 +75,8 @@ public:
 
     /* ---- Recoveries ---- */
 
-    /* Opens a class for stanzas that have none. False if there is one. */
-    bool forge_class();
+    /* Opens a class for stanzas that have none. False if a class is open. */
+    bool open_placeholder_class();
     /* The open record of a kind is not completed. */
     void drop_record(int kind);
     /* The open element lacks nothing any more. */
@@ -84,7 +84,7 @@ public:
     /* The open run is not completed. */
     void give_up_run();
     /* Begins a run of a kind whose elements belong to nothing, with its first stanza. */
-    void begin_run_of_nobody(int kind);
+    void begin_ownerless_run(int kind);
     void expect_index(int index);
     /* An earlier overflow does not count any more. */
     void forget_overflow();

@@ -34,7 +34,7 @@ protected:
         try {
             take(text);
         } catch (const fatal_exit &failure) {
-            completing = failure.completing;
+            failed_record = failure.record;
             return failure.id;
         }
         return NO_MESSAGE;
@@ -42,7 +42,7 @@ protected:
 
     looking_on observer;
     stepwise_compiler compiler{"source", "Out.cdef", observer};
-    int completing = -1;
+    int failed_record = -1;
 };
 
 TEST_F(Stepwise, ObserverLearnsAttributesAndExcusesMissingOnes) {
@@ -70,7 +70,7 @@ TEST_F(Stepwise, FailureSaysWhichCompletionItEndedAndItsRecordCanBeDropped) {
     testing::internal::CaptureStdout();
     EXPECT_EQ(failing("DynamicClassAttribute"), MSG_INCOMPLETE_STANZA);
     EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
-    EXPECT_EQ(completing, SC_DYNAMIC_CLASS_ATTRIBUTE);
+    EXPECT_EQ(failed_record, SC_DYNAMIC_CLASS_ATTRIBUTE);
     compiler.drop_record(SC_DYNAMIC_CLASS_ATTRIBUTE);
     EXPECT_FALSE(compiler.is_open(SC_DYNAMIC_CLASS_ATTRIBUTE));
     EXPECT_EQ(failing("DynamicClassAttribute"), NO_MESSAGE);
@@ -91,15 +91,15 @@ TEST_F(Stepwise, RunCanBeGivenUpOrItsElementCompleted) {
 
 TEST_F(Stepwise, StanzasWithoutAClassGetOne) {
     EXPECT_EQ(failing("ClassAction"), MSG_NO_CLASS_FOR_ACTION);
-    EXPECT_TRUE(compiler.forge_class());
-    EXPECT_FALSE(compiler.forge_class());
+    EXPECT_TRUE(compiler.open_placeholder_class());
+    EXPECT_FALSE(compiler.open_placeholder_class());
     EXPECT_EQ(failing("ClassAction"), NO_MESSAGE);
 }
 
 TEST_F(Stepwise, ElementsOfNobodyAreTakenAllTheSame) {
     take("ControlDefinition");
     EXPECT_EQ(failing("PAttrSDDefinition"), MSG_NO_SD_ATTRIBUTE);
-    compiler.begin_run_of_nobody(SC_PATTR_SD_DEFINITION);
+    compiler.begin_ownerless_run(SC_PATTR_SD_DEFINITION);
     EXPECT_FALSE(compiler.run_makes_value());
     EXPECT_EQ(failing("\tElementIndex=1"), MSG_INDEX_NOT_CONSECUTIVE);
     compiler.expect_index(2);

@@ -11,11 +11,12 @@
 namespace check {
 
 /* To add a warning: a class in a file of this folder, its maker, a row, and its id. */
-maker make_carriage_return, make_comment_in_value, make_cut_short, make_element_type, make_incomplete, make_long_line,
-    make_lost_bytes, make_low_above_high, make_narrowed, make_no_resource_class, make_number_text, make_octal,
-    make_overridden, make_permission, make_range_elsewhere, make_same_id, make_same_name, make_sd_run_at_end,
+maker make_carriage_return, make_comma_list, make_comment_in_value, make_cut_short, make_element_type, make_group,
+    make_ignored_range, make_incomplete, make_intervals, make_long_line, make_lost_bytes, make_low_above_high,
+    make_narrowed, make_no_expression, make_no_resource_class, make_number_text, make_octal, make_overridden,
+    make_permission, make_properties, make_range_elsewhere, make_same_id, make_same_name, make_sd_run_at_end,
     make_sd_without_run, make_second_resource_class, make_stray_run, make_text_after_quote, make_unknown_locator,
-    make_unknown_variable_class, make_unused_default;
+    make_unknown_variable_class, make_unused_default, make_unused_variable_class;
 
 namespace {
 
@@ -61,7 +62,7 @@ constexpr row rows[] = {
       "Give one of them another number."},
      make_same_id},
     {{SAME_NAME, "S506", "same-name", "two of one kind have the same name",
-      "Two attributes, actions or elements of one kind have the same name.", "Rename one."},
+      "Two attributes, actions or elements of one kind, or two variable classes, have the same name.", "Rename one."},
      make_same_name},
     {{RANGE_ELSEWHERE, "S503", "range-elsewhere", "a Range does not reach its attribute",
       "A `Range` of a `DynamicClassAttribute` is stored in a `DynamicResourceAttribute` that is still "
@@ -106,6 +107,37 @@ constexpr row rows[] = {
       "Only the last one counts.",
       "Remove one of the lines. For a list of values, choose an array type."},
      make_overridden},
+    {{COMMA_LIST, "S526", "comma-list", "a list with commas is not a list",
+      "A `ValidValue` or `ValidStateValue` of texts has more than one comma: it is a range, from what "
+      "comes before the first comma to all that comes after it. Or an element of a `StringArray` has "
+      "commas and no quotes: a line is one element.",
+      "Write one line for each value or element. Put an element with commas in quotes."},
+     make_comma_list},
+    {{IGNORED_RANGE, "S527", "ignored-range", "a Range of a type that has none",
+      "A `Range` of a `String`, a `Binary`, an `RH`, an `SD` or an array of these is ignored.",
+      "Remove the line. For strings, use `ValidStateValue`."},
+     make_ignored_range},
+    {{NO_EXPRESSION, "S528", "no-expression", "what belongs to an Expression is without one",
+      "A dynamic attribute has a `ReArmExpression` or an `ExpressionDescription`, but no `Expression`.",
+      "Add the `Expression`, or remove the line."},
+     make_no_expression},
+    {{GROUP, "S529", "group", "an attribute has the name of a group, but no group",
+      "An attribute has a `GroupName` but no `GroupID`, or its `GroupID` is 255, which means no group.",
+      "Give the group another number."},
+     make_group},
+    {{UNUSED_VARIABLE_CLASS, "S530", "unused-variable-class", "a variable class is never used",
+      "No dynamic attribute names a `ResourceVariableClass` as its `VariableClass`. Not reported while a "
+      "`VariableClass` has an unknown name (S505).",
+      "Remove it, or give attributes its name."},
+     make_unused_variable_class},
+    {{INTERVALS, "S531", "intervals", "a variable class is reported more often than observed",
+      "The `ReportingInterval` of a variable class is below its `ObservationInterval`.", "Exchange them."},
+     make_intervals},
+    {{PROPERTIES, "S532", "properties", "properties are repeated or contradictory",
+      "A property is given twice. Or two contradict each other: two of `ReqdForDefine`, `OptForDefine` "
+      "and `InvalForDefine`, or `ReqdForDefine` and `ReadOnly`.",
+      "Remove one of them."},
+     make_properties},
     {{INCOMPLETE, "S515", "incomplete", "a stanza lacks required attributes",
       "A stanza lacks required attributes, which the compiler does not notice: their fields are 0.", "Add them."},
      make_incomplete},

@@ -1,6 +1,9 @@
 /* same.cpp: warnings about names and Ids that are given twice. */
 
+#include "check/first_lines.h"
 #include "check/warnings/watcher.h"
+
+#include <string_view>
 
 namespace check {
 
@@ -16,9 +19,25 @@ public:
     static constexpr std::array types = {AT_STRING, AT_SD_NAME};
 
     void value(const view &see) override {
-        if (int first = see.known.declared.earlier_name; first != 0)
+        if (int first = earlier(see); first != 0)
             report(see, see.value_place(), another(see, "name"), {{first, 0, 0}, "first given here"});
     }
+
+private:
+    /* The line that gave the current line's name first; 0: none did. Variable classes belong to no class. */
+    int earlier(const view &see) {
+        if (see.known.kind != SC_RESOURCE_VARIABLE_CLASS)
+            return see.known.declared.earlier_name;
+        if (std::string_view(see.attr().ta_name) != "VariableClass")
+            return 0;
+        int &line = variable_classes.line_of(see.value());
+        int first = line;
+        if (first == 0)
+            line = see.line.number;
+        return first;
+    }
+
+    first_lines variable_classes;
 };
 
 class same_id : public watcher {

@@ -123,6 +123,46 @@ private:
     }
 };
 
+/* Bounds are split at the first comma only, and defaults not at all. */
+class comma_list : public watcher {
+public:
+    using watcher::watcher;
+    static constexpr std::array types = {AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
+
+    void value(const view &see) override {
+        if (!is_string(see))
+            return;
+        if (is_valid_value(see))
+            look_at_bounds(see);
+        else if (see.compiler.data_type() == VX_CHAR_PTR_ARRAY)
+            look_at_element(see);
+    }
+
+private:
+    void look_at_bounds(const view &see) {
+        bounds both(see.value());
+        if (!both.two() || both.high.find(',') == std::string_view::npos)
+            return;
+        report(see, see.value_place(),
+               "only the first comma counts: this is a range from " + language::quoted(both.low) + " to " +
+                   language::quoted(both.high),
+               {see.value_place(), "write one " + name_of(see) + " line for each value"});
+    }
+    /* A quoted text may well have a comma. */
+    void look_at_element(const view &see) {
+        place at = see.value_place();
+        if (see.value().find(',') == std::string_view::npos || see.line.raw[at.column - 2] == '"')
+            return;
+        bool one = see.attr().ta_type == AT_INITIAL_VALUE;
+        report(see, at, "this is one element, with its commas",
+               {at, one ? "an `InitialValue` has one element; quote it if the commas belong to it"
+                        : "write one " + name_of(see) + " line for each element, or quote a text with commas"});
+    }
+    static std::string name_of(const view &see) {
+        return language::quoted(see.attr().ta_name);
+    }
+};
+
 } // namespace
 
 made_watcher make_lost_bytes(const watcher_setup &setup) {
@@ -131,6 +171,10 @@ made_watcher make_lost_bytes(const watcher_setup &setup) {
 
 made_watcher make_comment_in_value(const watcher_setup &setup) {
     return make<comment_in_value>(setup);
+}
+
+made_watcher make_comma_list(const watcher_setup &setup) {
+    return make<comma_list>(setup);
 }
 
 } // namespace check

@@ -1,5 +1,5 @@
-/* unknown.cpp: warnings about names that nothing in the source has. They are reported at the end, and only for a source
- * without errors: all that could have the name must have been understood. */
+/* unknown.cpp: warnings about names that nothing in the source has, or uses. They are reported at the end, and only for
+ * a source without errors: all that could have the name must have been understood. */
 
 #include "check/first_lines.h"
 #include "check/lacking.h"
@@ -81,6 +81,38 @@ private:
     bool unnamed = false; /* a variable class lacks its name: it may be any of those that are used */
 };
 
+/* Reports each name once, where it is defined first. A name that nothing defines may be a misspelt one of these. */
+class unused_variable_class : public watcher {
+public:
+    using watcher::watcher;
+    static constexpr std::array types = {AT_STRING};
+
+    void value(const view &see) override {
+        if (std::string_view(see.attr().ta_name) != "VariableClass")
+            return;
+        bool defines = see.known.kind == SC_RESOURCE_VARIABLE_CLASS;
+        int &first = (defines ? defined_lines : used).line_of(see.value());
+        if (defines && first == 0)
+            defined.push_back(see.value_mention());
+        first = see.line.number;
+    }
+
+    void source_end(const view &see) override {
+        language::name_list names = used.all();
+        bool all_known = std::all_of(names.begin(), names.end(), [&](auto name) { return defined_lines.has(name); });
+        if (see.errors() > 0 || !all_known)
+            return;
+        for (const mention &each : defined)
+            if (!used.has(each.text))
+                report(each.at, each.source, "no dynamic attribute belongs to this variable class");
+    }
+
+private:
+    std::vector<mention> defined; /* each name once */
+    first_lines defined_lines;
+    first_lines used;
+};
+
 } // namespace
 
 made_watcher make_unknown_locator(const watcher_setup &setup) {
@@ -89,6 +121,10 @@ made_watcher make_unknown_locator(const watcher_setup &setup) {
 
 made_watcher make_unknown_variable_class(const watcher_setup &setup) {
     return make<unknown_variable_class>(setup);
+}
+
+made_watcher make_unused_variable_class(const watcher_setup &setup) {
+    return make<unused_variable_class>(setup);
 }
 
 } // namespace check

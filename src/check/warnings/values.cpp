@@ -1,10 +1,13 @@
 /* values.cpp: warnings about single values that mean less than they say. */
 
 #include "check/warnings/watcher.h"
+#include "format/data_types.h"
 #include "format/names.h"
 
 #include <algorithm>
 #include <iterator>
+#include <string_view>
+#include <vector>
 
 namespace check {
 
@@ -54,6 +57,67 @@ public:
     }
 };
 
+class ignored_range : public watcher {
+public:
+    using watcher::watcher;
+    static constexpr std::array types = {AT_RANGE};
+
+    void value(const view &see) override {
+        switch (scalar_vx(see.compiler.data_type())) {
+        case VX_CHAR_PTR:
+        case VX_BINARY_PTR:
+        case VX_RSRC_HANDLE_PTR:
+        case VX_SD_PTR:
+            report(see, see.text_place(),
+                   "the type " + language::quoted(see.known.stanza().data_type.text) +
+                       " has no range: this line is ignored");
+            return;
+        default:
+            return;
+        }
+    }
+};
+
+class properties : public watcher {
+public:
+    using watcher::watcher;
+    static constexpr std::array types = {AT_CLASS_PROPS, AT_PATTR_PROPS, AT_DATTR_PROPS, AT_ACTION_PROPS};
+
+    void value(const view &see) override {
+        std::string_view list = see.value();
+        std::vector<std::string_view> earlier;
+        for (size_t begin = 0; begin < list.size();) {
+            size_t end = std::min(list.find(',', begin), list.size());
+            std::string_view name = list.substr(begin, end - begin);
+            look_at(see, see.part_of_value(begin, name.size()), name, earlier);
+            earlier.push_back(name);
+            begin = end + 1;
+        }
+    }
+
+private:
+    void look_at(const view &see, const place &at, std::string_view name,
+                 const std::vector<std::string_view> &earlier) {
+        if (name.empty())
+            return;
+        if (std::find(earlier.begin(), earlier.end(), name) != earlier.end())
+            return report(see, at, "this property is given already");
+        for (std::string_view other : earlier)
+            if (contradict(name, other))
+                return report(see, at, language::quoted(name) + " contradicts " + language::quoted(other));
+    }
+    /* Whether a definition must, may or must not give the attribute. What it must give cannot be only read. */
+    static bool contradict(std::string_view one, std::string_view other) {
+        constexpr std::string_view PAIRS[][2] = {{"ReqdForDefine", "OptForDefine"},
+                                                 {"ReqdForDefine", "InvalForDefine"},
+                                                 {"OptForDefine", "InvalForDefine"},
+                                                 {"ReqdForDefine", "ReadOnly"}};
+        return std::any_of(std::begin(PAIRS), std::end(PAIRS), [&](const auto &pair) {
+            return (pair[0] == one && pair[1] == other) || (pair[0] == other && pair[1] == one);
+        });
+    }
+};
+
 } // namespace
 
 made_watcher make_unused_default(const watcher_setup &setup) {
@@ -66,6 +130,14 @@ made_watcher make_permission(const watcher_setup &setup) {
 
 made_watcher make_element_type(const watcher_setup &setup) {
     return make<element_type>(setup);
+}
+
+made_watcher make_ignored_range(const watcher_setup &setup) {
+    return make<ignored_range>(setup);
+}
+
+made_watcher make_properties(const watcher_setup &setup) {
+    return make<properties>(setup);
 }
 
 } // namespace check

@@ -116,6 +116,45 @@ TEST(Permission, IsOneKnownLetter) {
     EXPECT_EQ(found_in(action + "qx\n"), codes{"S512 22:13+2"});
 }
 
+TEST(CommaList, IsReportedForTexts) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tValidValue=a,b,c\n")), codes{"S526 23:13+5"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tValidValue=a,b\n")), codes());
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "StringArray", "\tDefaultValue=a,b\n")), codes{"S526 23:15+3"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "StringArray", "\tDefaultValue=\"a,b\"\n")), codes());
+}
+
+TEST(IgnoredRange, IsReportedForTypesWithoutOne) {
+    std::string stanza = dynamic(RESOURCE, "A", "0", "\tRange=1,2\n");
+    EXPECT_EQ(found_in(CLASS + stanza), codes());
+    EXPECT_EQ(found_in(CLASS + stanza.replace(stanza.find("UInt32"), 6, "String")), codes{"S527 24:2+9"});
+}
+
+TEST(NoExpression, IsReportedAtWhatNeedsOne) {
+    EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "A", "0", "\tReArmExpression=x\n")), codes{"S528 24:2+15"});
+    EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "A", "0", "\tReArmExpression=x\n\tExpression=y\n")), codes());
+}
+
+TEST(Group, IsANumberAndNot255) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tGroupName=1\n")), codes{"S529 23:2+9"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tGroupID=255\n")), codes{"S529 23:10+3"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tGroupName=1\n\tGroupID=254\n")), codes());
+}
+
+TEST(Properties, AreReportedIfRepeatedOrContradictory) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tProperties=Public,Public\n")), codes{"S532 23:20+6"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tProperties=ReadOnly,ReqdForDefine\n")),
+              codes{"S532 23:22+13"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tProperties=ReadOnly,Public\n")), codes());
+}
+
+TEST(VariableClasses, AreNamedUsedAndReportedNoMoreOftenThanObserved) {
+    std::string defined = "ResourceVariableClass\n\tVariableClass=V\n\tObservationInterval=2\n\tReportingInterval=2\n";
+    std::string used = CLASS + dynamic(RESOURCE, "A", "0", "\tVariableClass=V\n");
+    EXPECT_EQ(found_in(CLASS + defined), codes{"S530 17:16+1"});
+    EXPECT_EQ(found_in(used + defined + defined), codes{"S506 30:16+1"});
+    EXPECT_EQ(found_in(used + defined.replace(defined.rfind('2'), 1, "1")), codes{"S531 28:20+1"});
+}
+
 /* ---- Names and Ids --------------------------------------------------------------------------------------------- */
 
 TEST(SameName, IsReportedWithinAKind) {

@@ -313,14 +313,14 @@ void check_sd_index(const attr_line &line) {
     cdgen &cx = line.cx;
     vx_value_t index = {};
     if (str_to_vx(cx, &index, VX_UINT32, line.value, cx.line_texts) == 0)
-        cx.sd.curr_sdeli = static_cast<int>(index.val_uint32);
-    if (cx.sd.curr_sdeli != cx.sd.expected_sdeli) {
+        cx.sd.set_index(static_cast<int>(index.val_uint32));
+    if (cx.sd.index() != cx.sd.expected_index()) {
         if (cx.options.explanations != nullptr)
-            fprintf(cx.options.explanations, "curr_sdel = %d, expected_sdeli = %d\n", cx.sd.curr_sdeli,
-                    cx.sd.expected_sdeli);
+            fprintf(cx.options.explanations, "curr_sdel = %d, expected_sdeli = %d\n", cx.sd.index(),
+                    cx.sd.expected_index());
         source_error(cx, MSG_INDEX_NOT_CONSECUTIVE);
     }
-    cx.sd.expected_sdeli = static_cast<int>(static_cast<unsigned>(cx.sd.curr_sdeli) + 1);
+    cx.sd.expect_index(static_cast<int>(static_cast<unsigned>(cx.sd.index()) + 1));
 }
 
 /* An unknown type is deliberately no error here. */
@@ -331,13 +331,13 @@ void store_sd_data_type(const attr_line &line) {
         source_error(cx, MSG_SD_IN_SD);
     store(field_of(line), type);
     cx.sd.element.sd_dt_found = 1;
-    if (cx.sd.attr_dflt_val == nullptr)
+    if (!cx.sd.makes_value())
         return;
     dflt_tbl &dflt = line.state.dflt;
     *static_cast<vx_value_t *>(alloc_tble(cx, &dflt.tbl->cells, sizeof(vx_value_t))) = {
         .val_uint32 = static_cast<vx_uint32_t>(type)};
     ++dflt.num_elems;
-    ++cx.sd.sd_num_elems;
+    cx.sd.count_element();
 }
 
 void store_sd_valid_value(const attr_line &line) {

@@ -32,7 +32,7 @@ void file_element(cdgen &cx) {
     tbl *sd_defs = staged_tbl(cx.staged.cb_rsrc_class.u_rc_sd_defs);
     if (sd_defs == nullptr)
         source_error(cx, MSG_NO_SD_TABLE);
-    size_t section = cx.sd.curr_sd_tbl->offset[0];
+    size_t section = cx.sd.section()->offset[0];
     sd_field_t field = cx.staged.cb_sd_def.sd_fields[0];
     field.sd_action_id = NO_ACTION_ID;
     field.sd_valid_type = VALID_TYPE;
@@ -47,8 +47,8 @@ void file_element(cdgen &cx) {
 /* The attribute's value is one of the defaults of the run's element types. */
 void dump_sd_default(cdgen &cx, const srtable_ctrl *scp) {
     dflt_tbl &dflt = cx.framing.stanzas[static_cast<size_t>(scp - sc_tables.data())].dflt;
-    dflt.num_elems = cx.sd.sd_num_elems;
-    dump_dflt(cx, staged_tbl(cx.staged.cb_rsrc_class.u_rc_strings), &dflt, cx.sd.attr_dflt_val,
+    dflt.num_elems = cx.sd.elements();
+    dump_dflt(cx, staged_tbl(cx.staged.cb_rsrc_class.u_rc_strings), &dflt, cx.sd.value(),
               dflt.tbl->sd_type == VX_SD_PTR ? VX_SD_PTR : VX_SD_PTR_ARRAY);
 }
 
@@ -57,7 +57,7 @@ void dump_sd_element(cdgen &cx, tbl *str_tbl, const dflt_tbl *vtbl, size_t i, vx
                      sd_anchors *anchors) {
     auto type =
         static_cast<vx_data_type_t>(record_at<vx_value_t>(&vtbl->tbl->cells, i * sizeof(vx_value_t))->val_uint32);
-    int mode = cx.sd.sd_attr_type == 0 ? DFLT_DEFAULT : INIT_DEFAULT;
+    int mode = cx.sd.attribute_type() == 0 ? DFLT_DEFAULT : INIT_DEFAULT;
     anchors->array.reset();
     auto count = static_cast<vx_uint32_t>(vtbl->num_elems);
     if (copy_this_sd_type(cx, lval, type, mode, str_tbl, anchors, count, dt) != 0)
@@ -93,7 +93,7 @@ void init_sd_tbl(cdgen &cx) {
 void cmplt_sd_tbl(cdgen &cx, const srtable_ctrl *scp) {
     require_class(cx, NO_CLASS);
     init_sd_tbl(cx); /* files the last element */
-    if (cx.sd.attr_dflt_val != nullptr)
+    if (cx.sd.makes_value())
         completing(SC_PATTR_SD_DEFINITION, [&] { dump_sd_default(cx, scp); });
     cx.sd.end();
     cx.staged.cb_sd_def.sd_cb_ID = 0;

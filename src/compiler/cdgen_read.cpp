@@ -26,11 +26,10 @@ cdb_ref_t *owner_field(cdgen &cx, const sd_owner &owner) {
 void begin_sd_run(cdgen &cx, bool of_attribute) {
     if (!of_attribute && !class_is_open(cx))
         source_error(cx, MSG_NO_CLASS_FOR_SD);
-    if (cx.sd.curr_sd_tbl == nullptr)
-        cx.sd.curr_sd_tbl = owner_field(cx, *cx.framing.scp->sc_sd_owner);
-    if (cx.sd.curr_sd_tbl != nullptr)
+    cx.sd.belong_to(owner_field(cx, *cx.framing.scp->sc_sd_owner));
+    if (cx.sd.has_section())
         cx.sd.begin(mk_sd_sec(cx));
-    if (of_attribute && cx.sd.attr_dflt_val == nullptr)
+    if (of_attribute && !cx.sd.makes_value())
         source_error(cx, MSG_NO_SD_ATTRIBUTE);
 }
 
@@ -48,19 +47,13 @@ void forget_values(cdgen &cx, dflt_tbl &dflt) {
 void begin_sd_stanza(cdgen &cx) {
     bool of_attribute = cx.framing.scp->sc_sd_owner->is_attribute();
     stanza_state &state = state_of(cx, cx.framing.scp);
-    if (cx.staged.cb_sd_def.sd_cb_ID != 0 && cx.framing.prev_scp != cx.framing.scp) {
+    if (cx.staged.cb_sd_def.sd_cb_ID != 0 && cx.framing.prev_scp != cx.framing.scp)
         cmplt_sd_tbl(cx, cx.framing.prev_scp);
-        if (!of_attribute)
-            cx.sd.curr_sd_tbl = nullptr;
-    }
-    if (of_attribute && cx.sd.attr_dflt_val != nullptr)
+    if (of_attribute && cx.sd.makes_value())
         state.dflt = state_of(cx, cx.framing.prev_scp).dflt;
-    if (!of_attribute) {
-        cx.sd.leave_attribute();
-        if (cx.staged.cb_sd_def.sd_cb_ID == 0)
-            cx.sd.curr_sd_tbl = nullptr;
-    }
     if (cx.staged.cb_sd_def.sd_cb_ID == 0) {
+        if (!of_attribute)
+            cx.sd.forget_owner();
         begin_sd_run(cx, of_attribute);
         if (!of_attribute)
             forget_values(cx, state.dflt);

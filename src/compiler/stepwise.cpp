@@ -129,7 +129,7 @@ void stepwise_compiler::begin_ownerless_run(int kind) {
 }
 
 void stepwise_compiler::expect_index(int index) {
-    cx.sd.expected_sdeli = index;
+    cx.sd.expect_index(index);
 }
 
 void stepwise_compiler::forget_overflow() {

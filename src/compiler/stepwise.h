@@ -55,18 +55,18 @@ public:
 
     /* The index of the run's latest element, and the one that the next element must have. */
     int element_index() const {
-        return cx.sd.curr_sdeli;
+        return cx.sd.index();
     }
     int expected_index() const {
-        return cx.sd.expected_sdeli;
+        return cx.sd.expected_index();
     }
     /* Whether the elements that follow, or that are open, make the value of an attribute. */
     bool run_makes_value() const {
-        return cx.sd.attr_dflt_val != nullptr;
+        return cx.sd.makes_value();
     }
     /* Whether the run's highest index is stored. */
     bool run_has_highest_index() const {
-        return cx.sd.max_sd_idx != nullptr;
+        return cx.sd.highest_index() != nullptr;
     }
     /* errno as the number conversions see it. */
     int conversion_errno() const {

@@ -306,13 +306,13 @@ TEST(DataType, StructuredDataAwaitTheirRun) {
         for (const char *name : {"SD", "SDArray"}) {
             opened c;
             bool dynamic = kind == DYNAMIC[0] || kind == DYNAMIC[1];
-            c.cx.sd.sd_attr_type = 9;
+            c.cx.sd.announce(nullptr, nullptr, nullptr, 9);
             EXPECT_EQ(fed(c, kind, std::string("DataType=") + name), WELL);
             auto *record = sc_cb(c.cx, sc_tables[kind]);
-            EXPECT_EQ(reinterpret_cast<char *>(c.cx.sd.attr_dflt_val), record + (dynamic ? 32 : 24));
-            EXPECT_EQ(reinterpret_cast<char *>(c.cx.sd.curr_sd_tbl), record + (dynamic ? 72 : 56));
-            EXPECT_EQ(reinterpret_cast<char *>(c.cx.sd.max_sd_idx), record + (dynamic ? 124 : 64));
-            EXPECT_EQ(c.cx.sd.sd_attr_type, dynamic ? 1 : 0);
+            EXPECT_EQ(reinterpret_cast<char *>(c.cx.sd.value()), record + (dynamic ? 32 : 24));
+            EXPECT_EQ(reinterpret_cast<char *>(c.cx.sd.section()), record + (dynamic ? 72 : 56));
+            EXPECT_EQ(reinterpret_cast<char *>(c.cx.sd.highest_index()), record + (dynamic ? 124 : 64));
+            EXPECT_EQ(c.cx.sd.attribute_type(), dynamic ? 1 : 0);
             const tbl &types = c.state(kind).dflt.tbl->cells;
             EXPECT_STREQ(types.tbl_name, std::string(name) == "SD" ? "VX_SD_PTR" : "VX_SD_PTR_ARRAY");
             EXPECT_EQ(c.state(kind).dflt.tbl->sd_type, std::string(name) == "SD" ? VX_SD_PTR : VX_SD_PTR_ARRAY);
@@ -325,8 +325,8 @@ TEST(DataType, OnlyStructuredDataAwaitARun) {
     for (const char *name : {"None", "Int32", "String", "RH", "SBS", "RHArray", "Float64Array"}) {
         opened c;
         EXPECT_EQ(fed(c, SC_DYNAMIC_RESOURCE_ATTRIBUTE, std::string("DataType=") + name), WELL);
-        EXPECT_EQ(c.cx.sd.attr_dflt_val, nullptr);
-        EXPECT_EQ(c.cx.sd.curr_sd_tbl, nullptr);
+        EXPECT_EQ(c.cx.sd.value(), nullptr);
+        EXPECT_EQ(c.cx.sd.section(), nullptr);
         EXPECT_EQ(c.state(SC_DYNAMIC_RESOURCE_ATTRIBUTE).dflt.tbl, nullptr);
     }
 }

@@ -43,11 +43,11 @@ TEST(Element, IndexesFollowOneAnother) {
     opened c;
     for (int i = 0; i < 3; ++i) {
         EXPECT_EQ(fed(c, RESET, "ElementIndex=" + std::to_string(i)), WELL);
-        EXPECT_EQ(c.cx.sd.curr_sdeli, i);
-        EXPECT_EQ(c.cx.sd.expected_sdeli, i + 1);
+        EXPECT_EQ(c.cx.sd.index(), i);
+        EXPECT_EQ(c.cx.sd.expected_index(), i + 1);
     }
     EXPECT_EQ(fed(c, RESET, "ElementIndex=4294967299"), WELL); /* the low 32 bits */
-    EXPECT_EQ(c.cx.sd.curr_sdeli, 3);
+    EXPECT_EQ(c.cx.sd.index(), 3);
 }
 
 TEST(Element, IndexOutOfOrderIsShownAndRefused) {
@@ -121,11 +121,11 @@ TEST(Element, ValidValuesAreAListOfItsType) {
 TEST(Element, TypeIsCollectedForAnAttributesValueOnly) {
     compilation of_class, of_attribute;
     of_class.read(CLASS + element("ResetSDDefinition", 0, "Int32"));
-    EXPECT_EQ(of_class.cx.sd.sd_num_elems, 0U);
+    EXPECT_EQ(of_class.cx.sd.elements(), 0U);
     EXPECT_EQ(of_class.cx.framing.stanzas[RESET].dflt.tbl, nullptr);
     of_attribute.read(CLASS + pattr(P, "SD") + element("PAttrSDDefinition", 0, "Int32") +
                       element("PAttrSDDefinition", 1, "StringArray"));
-    EXPECT_EQ(of_attribute.cx.sd.sd_num_elems, 2U);
+    EXPECT_EQ(of_attribute.cx.sd.elements(), 2U);
     const dflt_tbl &types = of_attribute.cx.framing.stanzas[SC_PATTR_SD_DEFINITION].dflt;
     EXPECT_EQ(types.num_elems, 2U);
     auto cells = records_of<vx_value_t>(&types.tbl->cells);
@@ -162,8 +162,7 @@ TEST(Element, NeedsAClass) {
 void give_all(opened &c) {
     c.cx.sd.element.sd_name_found = c.cx.sd.element.sd_desc_found = c.cx.sd.element.sd_disp_found =
         c.cx.sd.element.sd_dt_found = 1;
-    c.cx.sd.curr_sd_tbl = &c.cx.staged.cb_rsrc_class.u_rc_reset_input;
-    c.cx.sd.curr_sd_tbl->offset[0] = mk_sd_sec(c.cx);
+    c.cx.sd.begin_for(c.cx.staged.cb_rsrc_class.u_rc_reset_input, mk_sd_sec(c.cx));
 }
 
 TEST(Element, NeedsNameTypeAndBothMessages) {
@@ -228,13 +227,13 @@ TEST(Element, IsFiledByWhatFollows) {
     EXPECT_EQ(c.elements_at(c.cx.staged.cb_rsrc_class.u_rc_reset_input).size(), 0U);
     c.read(element("ResetSDDefinition", 1, "Int32"));
     EXPECT_EQ(c.elements_at(c.cx.staged.cb_rsrc_class.u_rc_reset_input).size(), 1U);
-    EXPECT_EQ(c.cx.sd.curr_sdeli, 1);
-    EXPECT_EQ(c.cx.sd.expected_sdeli, 2);
+    EXPECT_EQ(c.cx.sd.index(), 1);
+    EXPECT_EQ(c.cx.sd.expected_index(), 2);
     cmplt_sd_tbl(c.cx, c.cx.framing.curr_sd_scp);
     EXPECT_EQ(c.elements_at(c.cx.staged.cb_rsrc_class.u_rc_reset_input).size(), 2U);
     EXPECT_EQ(c.cx.staged.cb_sd_def.sd_cb_ID, 0U);
-    EXPECT_EQ(c.cx.sd.curr_sdeli, -1);
-    EXPECT_EQ(c.cx.sd.expected_sdeli, 0);
+    EXPECT_EQ(c.cx.sd.index(), -1);
+    EXPECT_EQ(c.cx.sd.expected_index(), 0);
 }
 
 /* The table grows several times meanwhile. */
@@ -493,7 +492,7 @@ TEST(CollectedValues, MustBeOfATypeThatCanBeCopied) {
         tbl strings(64, "strings");
         vx_value_t value = {.val_uint64 = 0};
         dflt_tbl unknown = collected(c.cx, {0});
-        c.cx.sd.sd_attr_type = sd_attr_type;
+        c.cx.sd.announce(nullptr, nullptr, nullptr, sd_attr_type);
         EXPECT_EQ(ending_of([&, type = type] { dump_dflt(c.cx, &strings, &unknown, &value, type); }),
                   (ending{message, LINE, 1}));
     }

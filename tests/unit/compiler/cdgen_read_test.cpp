@@ -303,13 +303,13 @@ TEST(Reader, IncompleteStanzaIsReportedAtTheHeaderThatClosesIt) {
 TEST(Reader, PlainHeaderForgetsTheStructuredAttribute) {
     compilation c;
     c.read(CLASS + pattr("PersistentResourceAttribute", "SD"));
-    EXPECT_EQ(c.cx.sd.attr_dflt_val, &c.cx.staged.cb_rsrc_pattr.ra_dflt_value);
-    EXPECT_EQ(c.cx.sd.curr_sd_tbl, &c.cx.staged.cb_rsrc_pattr.u_ra_sd);
-    EXPECT_EQ(c.cx.sd.max_sd_idx, &c.cx.staged.cb_rsrc_pattr.ra_max_sd_idx);
+    EXPECT_EQ(c.cx.sd.value(), &c.cx.staged.cb_rsrc_pattr.ra_dflt_value);
+    EXPECT_EQ(c.cx.sd.section(), &c.cx.staged.cb_rsrc_pattr.u_ra_sd);
+    EXPECT_EQ(c.cx.sd.highest_index(), &c.cx.staged.cb_rsrc_pattr.ra_max_sd_idx);
     c.read("ResourceVariableClass\n");
-    EXPECT_EQ(c.cx.sd.attr_dflt_val, nullptr);
-    EXPECT_EQ(c.cx.sd.curr_sd_tbl, nullptr);
-    EXPECT_EQ(c.cx.sd.max_sd_idx, nullptr);
+    EXPECT_EQ(c.cx.sd.value(), nullptr);
+    EXPECT_EQ(c.cx.sd.section(), nullptr);
+    EXPECT_EQ(c.cx.sd.highest_index(), nullptr);
 }
 
 TEST(Reader, AttributeRunMustFollowAnAttributeOfAnSdType) {

@@ -16,13 +16,14 @@ struct SdRun : testing::Test {
 TEST_F(SdRun, OfAnAttributeStoresItsSectionAndItsHighestIndex) {
     run.announce(&value, &section, &highest, 1);
     run.begin(40);
-    run.curr_sdeli = 2;
+    run.set_index(2);
     run.end();
     EXPECT_EQ(section.offset[0], 40u);
     EXPECT_EQ(highest, 2);
-    EXPECT_EQ(run.curr_sdeli, -1);
-    EXPECT_EQ(run.expected_sdeli, 0);
-    EXPECT_EQ(run.attr_dflt_val, &value);
+    EXPECT_EQ(run.index(), -1);
+    EXPECT_EQ(run.expected_index(), 0);
+    EXPECT_EQ(run.value(), &value);
+    EXPECT_EQ(run.state(), sd_run_state::OF_ATTRIBUTE);
 }
 
 TEST_F(SdRun, WithoutElementsHasTheHighestIndexOfNone) {
@@ -31,28 +32,57 @@ TEST_F(SdRun, WithoutElementsHasTheHighestIndexOfNone) {
     EXPECT_EQ(highest, 0xFFFF);
 }
 
-TEST_F(SdRun, AfterTheAttributeHasBeenLeftStoresNoIndex) {
+TEST_F(SdRun, WithoutAnOwnerStoresNoIndex) {
     run.announce(&value, &section, &highest, 0);
-    run.leave_attribute();
-    run.curr_sdeli = 2;
+    run.forget_owner();
+    run.set_index(2);
     run.end();
     EXPECT_EQ(highest, 7);
-    EXPECT_EQ(run.curr_sd_tbl, &section);
-    run.forget_owner();
-    EXPECT_EQ(run.curr_sd_tbl, nullptr);
+    EXPECT_EQ(run.state(), sd_run_state::NO_OWNER);
+    EXPECT_FALSE(run.has_section());
+    EXPECT_EQ(run.value(), nullptr);
+}
+
+TEST_F(SdRun, OfAFieldMakesNoValue) {
+    run.belong_to(&section);
+    run.begin(24);
+    EXPECT_EQ(run.state(), sd_run_state::OF_FIELD);
+    EXPECT_FALSE(run.makes_value());
+    EXPECT_EQ(section.offset[0], 24u);
+}
+
+TEST_F(SdRun, KeepsAnOwnerThatItHas) {
+    cdb_ref_t other = {};
+    run.announce(&value, &section, &highest, 0);
+    run.belong_to(&other);
+    EXPECT_EQ(run.section(), &section);
+    EXPECT_TRUE(run.makes_value());
+}
+
+TEST_F(SdRun, HasNoOwnerIfThereIsNoField) {
+    run.belong_to(nullptr);
+    EXPECT_EQ(run.state(), sd_run_state::NO_OWNER);
+}
+
+TEST_F(SdRun, CountsTheElementsOfOneRun) {
+    run.belong_to(&section);
+    run.count_element();
+    run.begin(0);
+    run.count_element();
+    EXPECT_EQ(run.elements(), 1u);
 }
 
 TEST_F(SdRun, GivenUpCountsFromTheBeginning) {
     cdb_ref_t nobody = {};
     run.announce(&value, &section, &highest, 0);
     run.begin_for(nobody, 16);
-    run.curr_sdeli = 1;
-    run.expected_sdeli = 2;
+    run.set_index(1);
+    run.expect_index(2);
     run.give_up();
     EXPECT_EQ(nobody.offset[0], 16u);
     EXPECT_EQ(highest, 7);
-    EXPECT_EQ(run.expected_sdeli, 0);
-    EXPECT_EQ(run.curr_sd_tbl, nullptr);
+    EXPECT_EQ(run.expected_index(), 0);
+    EXPECT_EQ(run.state(), sd_run_state::NO_OWNER);
 }
 
 TEST(SdElement, IsCompleteWithFourAttributesWhateverItsValidValues) {

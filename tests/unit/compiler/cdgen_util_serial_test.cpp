@@ -430,7 +430,8 @@ TEST(SerialCollections, NoneLeaveTheCellAlone) {
 TEST(SerialCollections, ElementTypesMakeAStructure) {
     for (int sd_attr_type : {0, 1}) {
         serial scalar, array;
-        scalar.cx.sd.sd_attr_type = array.cx.sd.sd_attr_type = sd_attr_type;
+        scalar.cx.sd.announce(nullptr, nullptr, nullptr, sd_attr_type);
+        array.cx.sd.announce(nullptr, nullptr, nullptr, sd_attr_type);
         dump(scalar, VX_SD_PTR, {VX_INT32, VX_CHAR_PTR});
         EXPECT_EQ(scalar.added(), bytes().u32(2, 0, 2).fill(12).u32(8, 0, 48, 0).fill(8).all);
         dump(array, VX_SD_PTR_ARRAY, {VX_INT32_ARRAY, VX_UINT64_ARRAY});
@@ -446,7 +447,7 @@ TEST(SerialCollections, ThatCannotBeCopiedAreFatal) {
     auto end = [&](vx_data_type_t type) { return ending_of([&] { dump(s, type, {VX_UNKNOWN}); }); };
     EXPECT_EQ(end(VX_UNKNOWN), (ending{"dump_dflt: copy_this_type error", 7, 1}));
     EXPECT_EQ(end(VX_SD_PTR), (ending{"dump_dflt: copy_this_sd_type default error", 7, 1}));
-    s.cx.sd.sd_attr_type = 1;
+    s.cx.sd.announce(nullptr, nullptr, nullptr, 1);
     EXPECT_EQ(end(VX_SD_PTR_ARRAY), (ending{"dump_dflt: copy_this_sd_type init error", 7, 1}));
 }
 

@@ -1,6 +1,7 @@
 /* recover_header.cpp: takes headers, and continues after one that is refused. */
 
 #include "check/recovery.h"
+#include "language/limits.h"
 #include "language/names.h"
 
 #include <string>
@@ -168,7 +169,7 @@ void recovery::unknown_header(const attr_text &text, const fatal_exit &failure) 
     if (std::optional<std::string> stripped = stripped_header(error, name))
         return take_header(line.replaced(*stripped), false);
     if (line.continues)
-        return add("this is the rest of a line of more than 253 characters");
+        return add("this is the rest of a line of more than " + std::to_string(LINE_MAX_CHARS - 1) + " characters");
     if (front.size() < name.size() && !is_header(front) && known.kind >= 0) {
         add("an attribute line begins with a blank or a tab");
         return take_quietly(std::string("\t").append(name), 1);

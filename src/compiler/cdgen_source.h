@@ -66,7 +66,7 @@ void take_source(cdgen &cx, const char *filename, int fd);
 /* The same for a source in memory, which must stay until it has been read. */
 void take_source(cdgen &cx, std::string_view bytes);
 
-/* The next line, or the next 254 characters of a longer one, and counts it. It stays until the next call. */
+/* The next line, or the next LINE_MAX_CHARS bytes of a longer one, and counts it. It stays until the next call. */
 source_line next_line(cdgen &cx);
 
 /* A line's text: the line without its comment, and without trailing blanks and hash signs, even quoted ones. Its end is

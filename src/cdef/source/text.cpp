@@ -2,6 +2,7 @@
 
 #include "cdef/source/text.h"
 
+#include "language/limits.h"
 #include "text/append.h"
 #include "text/hex.h"
 #include "text/number.h"
@@ -12,7 +13,6 @@ namespace cdef::source {
 
 namespace {
 
-constexpr std::size_t LINE_MAX_CHARS = 254; /* what the compiler reads of a line at once */
 constexpr std::string_view BLANKS = " \t";
 
 /* Whether the compiler takes the whole line as text: no newline, no comment, nothing at the end that it removes. */

@@ -2,6 +2,8 @@
 
 #include "check/warnings/watcher.h"
 
+#include "language/limits.h"
+
 #include <string>
 
 namespace check {
@@ -16,8 +18,8 @@ public:
     void continued_line(const view &see) override {
         if (latest_piece != see.line.number - 1)
             report({see.line.number - 1, 0, 0}, {},
-                   "line of more than 253 characters: the rest is read as a line of its own, and later lines count one "
-                   "more");
+                   "line of more than " + std::to_string(LINE_MAX_CHARS - 1) +
+                       " characters: the rest is read as a line of its own, and later lines count one more");
         latest_piece = see.line.number;
     }
 

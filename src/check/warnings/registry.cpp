@@ -3,6 +3,8 @@
 
 #include "check/warnings/registry.h"
 
+#include "language/limits.h"
+
 #include <algorithm>
 #include <iterator>
 #include <string_view>
@@ -24,6 +26,8 @@ struct row {
     warning known;
     maker *make;
 };
+
+static_assert(LINE_MAX_CHARS == 254, "the cause of a long line says so");
 
 constexpr row rows[] = {
     {{LONG_LINE, "S516", "long-line", "a line is read in pieces",

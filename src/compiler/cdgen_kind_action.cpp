@@ -1,10 +1,9 @@
 /* cdgen_kind_action.cpp: actions of resources and of classes. */
 
 #include "compiler/cdgen_kind.h"
+#include "format/names.h"
 
 namespace {
-
-constexpr vx_uint32_t DEFAULT_PERMISSION = 0x40; /* letter s */
 
 /* What sets the two kinds apart. */
 struct action_kind {

@@ -1,12 +1,9 @@
 /* cdgen_kind_pattr.cpp: persistent attributes of resources and of classes. */
 
 #include "compiler/cdgen_kind.h"
+#include "format/names.h"
 
 namespace {
-
-constexpr vx_uint32_t REQD_FOR_DEFINE = 0x2;
-constexpr vx_uint32_t INVAL_FOR_DEFINE = 0x4;
-constexpr vx_uint32_t OPT_FOR_DEFINE = 0x8;
 
 /* What sets the two kinds apart. */
 struct pattr_kind {

@@ -68,9 +68,16 @@ inline constexpr props_t rc_props[] = {
 };
 inline constexpr int rc_props_cnt = std::size(rc_props);
 
+inline constexpr vx_uint32_t REQD_FOR_DEFINE = 0x2;
+inline constexpr vx_uint32_t INVAL_FOR_DEFINE = 0x4; /* what the compiler sets if none of the three is given */
+inline constexpr vx_uint32_t OPT_FOR_DEFINE = 0x8;
 inline constexpr props_t pa_props[] = {
-    {"Public", 0x20},      {"Select", 0x10},        {"ReqdForDefine", 0x2},
-    {"OptForDefine", 0x8}, {"InvalForDefine", 0x4}, {"ReadOnly", 0x1},
+    {"Public", 0x20},
+    {"Select", 0x10},
+    {"ReqdForDefine", REQD_FOR_DEFINE},
+    {"OptForDefine", OPT_FOR_DEFINE},
+    {"InvalForDefine", INVAL_FOR_DEFINE},
+    {"ReadOnly", 0x1},
 };
 inline constexpr int pa_props_cnt = std::size(pa_props);
 
@@ -85,5 +92,6 @@ inline constexpr valid_perms_t perm_list[] = {
     {'c', 0x20}, {'s', 0x40}, {'o', 0x80}, {'a', 0x100}, {'x', 0x200},
 };
 inline constexpr int num_perm_list = std::size(perm_list);
+inline constexpr vx_uint32_t DEFAULT_PERMISSION = 0x40; /* s: of an action without a Permission line */
 
 #endif

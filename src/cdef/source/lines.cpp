@@ -3,6 +3,7 @@
 #include "cdef/source/lines.h"
 
 #include "cdef/source/error.h"
+#include "format/names.h"
 #include "language/fields.h"
 #include "text/append.h"
 
@@ -15,7 +16,6 @@ namespace {
 
 using enum cdb::meaning;
 
-constexpr std::uint32_t DEFAULT_PERMISSION = 0x40;
 constexpr std::string_view NO_PERMISSION = "-"; /* stands for no permission letter */
 
 /* Required lines are in the order of their bits, except that those that may be repeated are last. Optional ones are in

@@ -8,14 +8,11 @@
 #include "cdef/source/runs.h"
 #include "cdef/source/structure.h"
 #include "cdef/source/text.h"
+#include "format/names.h"
 
 namespace cdef::source {
 
 namespace {
-
-constexpr std::uint32_t REQD_FOR_DEFINE = 0x2;
-constexpr std::uint32_t INVAL_FOR_DEFINE = 0x4;
-constexpr std::uint32_t OPT_FOR_DEFINE = 0x8;
 
 /* The runs of SD stanzas that belong to a record. */
 struct run_names {

@@ -58,7 +58,7 @@ std::string text_of_number(std::uint32_t number, cdb::meaning as) {
         return text_of_permission(number);
     case cdb::meaning::NONE_IS_65535:
     case cdb::meaning::LOCATOR:
-        return number == 0xFFFF ? "none" : std::to_string(number);
+        return number == cdb::none_of(as) ? "none" : std::to_string(number);
     case cdb::meaning::UNUSED: /* none and 0 lead nowhere alike */
         return number == CDB_NONE ? "0" : std::to_string(number);
     default:

@@ -5,6 +5,7 @@
 #include "compiler/cdgen_kinds.h"
 #include "compiler/cdgen_stanzas.h"
 #include "compiler/cdgen_values.h"
+#include "format/constants.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -84,7 +85,7 @@ void store_version(const attr_line &line) {
 
 /* The text is deliberately not interpreted. */
 void store_perm_template(const attr_line &line) {
-    store(field_of(line), vx_uint32_t{0xEEEEEEEE});
+    store(field_of(line), PERMISSIONS_GIVEN);
 }
 
 /* Only the first letter counts; an unknown letter leaves the field as it is. */

@@ -3,10 +3,9 @@
 #include "compiler/cdgen_closing.h"
 
 #include "compiler/cdgen_kinds.h"
+#include "format/constants.h"
 
 namespace {
-
-constexpr vx_uint16_t NO_LOCATOR = 0xFFFF;
 
 /* Completes a record if it is open. */
 template <auto Record, auto Identifier, void (*Complete)(cdgen &)> void complete_open(cdgen &cx) {

@@ -4,10 +4,8 @@
 
 #include "compiler/cdgen_context.h"
 #include "compiler/cdgen_kinds.h"
+#include "format/constants.h"
 #include "language/catalogue_rows.h"
-
-constexpr vx_uint16_t NO_SD_IDX = 0xFFFF;
-constexpr vx_uint16_t NO_GROUP = 255;
 
 /* "None" while staged. */
 inline void mark_absent(cdb_ref_t &ref) {

@@ -84,7 +84,7 @@ void open_dattr(cdgen &cx, const dattr_kind &kind) {
     mark_absent(attr.u_ra_express);
     mark_absent(attr.u_ra_vclass);
     mark_absent(attr.u_ra_rearm_expr);
-    attr.ra_max_sd_idx = NO_SD_IDX;
+    attr.ra_max_sd_idx = NO_SD_INDEX;
     mark_absent(attr.u_ra_sd);
     if (kind.id == resource_kind.id)
         cx.range.dattr_range_type = VX_UNKNOWN;

@@ -55,7 +55,7 @@ void open_pattr(cdgen &cx, const pattr_kind &kind) {
     mark_absent(attr.u_ra_sd);
     if (kind.valid_vals_absent_at_open)
         mark_absent(attr.u_ra_valid_vals);
-    attr.ra_max_sd_idx = NO_SD_IDX;
+    attr.ra_max_sd_idx = NO_SD_INDEX;
     cx.valid_values.vvdisp.reset();
     cx.valid_values.*kind.vv_found = 0;
 }

@@ -4,8 +4,6 @@
 
 namespace {
 
-constexpr vx_uint32_t NO_ACTION_ID = 65535;
-constexpr vx_uint16_t VALID_TYPE = 1;
 constexpr message_id NO_CLASS = MSG_NO_CLASS_FOR_SD;
 
 /* An empty list with room for its first entry. */
@@ -35,7 +33,7 @@ void file_element(cdgen &cx) {
     size_t section = cx.sd.section()->offset[0];
     sd_field_t field = cx.staged.cb_sd_def.sd_fields[0];
     field.sd_action_id = NO_ACTION_ID;
-    field.sd_valid_type = VALID_TYPE;
+    field.sd_valid_type = SD_VALID_TYPE;
     if (!cx.sd.element.sd_vv_found)
         mark_absent(field.u_sd_valid_vals);
     cx.sd.element.sd_vv_found = 0;

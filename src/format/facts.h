@@ -4,6 +4,7 @@
 #define CDGEN_FORMAT_FACTS_H
 
 #include "cdb_fields.h"
+#include "format/constants.h"
 #include "format/names.h"
 
 #include <algorithm>
@@ -72,6 +73,22 @@ constexpr std::span<const props_t> properties_of(meaning as) {
         return act_props;
     default:
         return {};
+    }
+}
+
+/* The number that stands for nothing in a field of this meaning. */
+constexpr std::optional<std::uint32_t> none_of(meaning as) {
+    switch (as) {
+    case meaning::NONE_IS_0:
+        return 0;
+    case meaning::NONE_IS_255:
+        return NO_GROUP;
+    case meaning::NONE_IS_65535:
+        return NO_SD_INDEX;
+    case meaning::LOCATOR:
+        return NO_LOCATOR;
+    default:
+        return std::nullopt;
     }
 }
 
@@ -312,8 +329,8 @@ inline constexpr field_fact sd_field[] = {
     filled("sd_disp_msgid", "DisplayName", "display name"),
     filled("sd_dscr_msgid", "Description", "description"),
     filled("u_sd_valid_vals", "ValidValue ValueDisplayName", "valid values"),
-    constant("sd_action_id", "action", PLAIN, 0xFFFF),
-    constant("sd_valid_type", "valid type", PLAIN, 1),
+    constant("sd_action_id", "action", PLAIN, NO_ACTION_ID),
+    constant("sd_valid_type", "valid type", PLAIN, SD_VALID_TYPE),
     nothing("sd_reserved"),
 };
 

@@ -93,10 +93,6 @@ fact section_type(std::uint32_t number) {
     return bits{number};
 }
 
-fact number_or_none(std::uint32_t number, std::uint32_t no_number) {
-    return number == no_number ? fact(none{}) : fact(std::uint64_t{number});
-}
-
 } // namespace
 
 std::uint32_t number_in(const cdb::bytes &area, std::size_t at, const cdb::field &f) {
@@ -105,6 +101,8 @@ std::uint32_t number_in(const cdb::bytes &area, std::size_t at, const cdb::field
 }
 
 fact fact_of(cdb::meaning as, std::uint32_t number) {
+    if (number == cdb::none_of(as))
+        return none{};
     switch (as) {
     case SIGNED:
         return std::int64_t{static_cast<std::int32_t>(number)};
@@ -130,14 +128,11 @@ fact fact_of(cdb::meaning as, std::uint32_t number) {
         return name_in(vxVarStr, number);
     case VERSION:
         return version(number);
+    case PLAIN:
     case NONE_IS_0:
-        return number_or_none(number, 0);
     case NONE_IS_255:
-        return number_or_none(number, 255);
     case NONE_IS_65535:
     case LOCATOR:
-        return number_or_none(number, 0xFFFF);
-    case PLAIN:
     case BOUND:
     case MANAGER:
     case OFFSET:

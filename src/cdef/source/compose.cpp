@@ -11,6 +11,7 @@
 #include "cdef/source/stanza.h"
 #include "cdef/source/structure.h"
 #include "cdef/source/text.h"
+#include "format/constants.h"
 #include "format/names.h"
 #include "text/shown.h"
 
@@ -20,8 +21,6 @@ namespace cdef::source {
 
 namespace {
 
-constexpr std::uint32_t PERMISSIONS_GIVEN = 0xEEEEEEEE;
-constexpr std::uint16_t NO_LOCATOR = 0xFFFF;
 constexpr std::string_view SUFFIX = ".cdef";
 
 constexpr std::string_view HEADING =

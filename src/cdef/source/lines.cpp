@@ -44,9 +44,8 @@ std::uint32_t number_in(const stanza_line &line, const stanza_record &from) {
 std::uint32_t number_without_line(cdb::meaning as, bool is_completed) {
     switch (as) {
     case NONE_IS_255:
-        return is_completed ? 255 : 0;
     case NONE_IS_65535:
-        return is_completed ? 65535 : 0;
+        return is_completed ? *cdb::none_of(as) : 0;
     case PERMISSIONS:
         return DEFAULT_PERMISSION;
     default:

@@ -9,8 +9,6 @@
 
 namespace cdef::source {
 
-inline constexpr std::uint16_t NO_INDEX = 0xFFFF;
-
 /* The types of a value's elements; of an array, those of the structure in it. */
 struct element_types {
     bool found = false; /* there is a value */

@@ -8,6 +8,7 @@
 #include "cdef/source/runs.h"
 #include "cdef/source/structure.h"
 #include "cdef/source/text.h"
+#include "format/constants.h"
 #include "format/names.h"
 
 namespace cdef::source {
@@ -172,7 +173,7 @@ private:
                                  .ends_file = plan.ends_in_run && is_last_step()};
         if (cdb::element_type(attr.type()) == VX_SD_PTR)
             write_structure(out, s, from.place);
-        else if (!s.definition.empty() || s.highest_index != NO_INDEX)
+        else if (!s.definition.empty() || s.highest_index != NO_SD_INDEX)
             no_source(from.place, "a structure, but it is of another type");
     }
 

@@ -6,6 +6,7 @@
 #include "cdef/source/lines.h"
 #include "cdef/source/lists.h"
 #include "cdef/source/runs.h"
+#include "format/constants.h"
 #include "text/shown.h"
 
 namespace cdef::source {
@@ -123,7 +124,7 @@ void write_late_run(source_writer &out, const attribute_structure &s, const elem
                     const std::string &place) {
     if (value.found)
         write_replaced_run(out, s, value, require_indices(value.types.size(), s.highest_index, place), place);
-    else if (s.highest_index != NO_INDEX)
+    else if (s.highest_index != NO_SD_INDEX)
         no_source(place, "a highest ElementIndex without a value");
     out.comment("The run ends the file: it comes too late for the value of its attribute.");
     write_run(out, s.stanza, s.definition, place);
@@ -146,7 +147,7 @@ void write_structure(source_writer &out, const attribute_structure &s, const std
     element_types value = types_of(s.value);
     if (!value.defaults)
         no_source(place, "no line sets the values of its structure");
-    if (s.definition.empty() && (value.found || s.highest_index != NO_INDEX))
+    if (s.definition.empty() && (value.found || s.highest_index != NO_SD_INDEX))
         no_source(place, "a structure's value without its definition");
     if (s.definition.empty())
         return;

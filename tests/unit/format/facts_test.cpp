@@ -18,6 +18,14 @@ std::string fields_header() {
 
 } // namespace
 
+TEST(format_facts, some_meanings_have_a_number_for_nothing) {
+    EXPECT_EQ(cdb::none_of(cdb::meaning::NONE_IS_0), 0U);
+    EXPECT_EQ(cdb::none_of(cdb::meaning::NONE_IS_255), 255U);
+    EXPECT_EQ(cdb::none_of(cdb::meaning::NONE_IS_65535), 65535U);
+    EXPECT_EQ(cdb::none_of(cdb::meaning::LOCATOR), 65535U);
+    EXPECT_EQ(cdb::none_of(cdb::meaning::PLAIN), std::nullopt);
+}
+
 /* Rows are checked against fields while compiling; this shows that no record is left out. */
 TEST(format_facts, every_record_with_fields_is_a_format) {
     std::string header = fields_header();

@@ -1,6 +1,7 @@
 /* What a structure tells about the run of SD stanzas that it came from. */
 
 #include "cdef/source/runs.h"
+#include "format/constants.h"
 
 #include <gtest/gtest.h>
 
@@ -11,14 +12,14 @@ using namespace cdef::source;
 TEST(SourceRuns, TheHighestIndexSaysHowManyElementsHadOne) {
     EXPECT_EQ(indices_given(3, 2), 3);
     EXPECT_EQ(indices_given(3, 0), 1);
-    EXPECT_EQ(indices_given(3, NO_INDEX), 0);
+    EXPECT_EQ(indices_given(3, NO_SD_INDEX), 0);
     EXPECT_EQ(indices_given(3, 3), std::nullopt);
 }
 
 /* Only 16 bits of an index are kept: as many rounds as fit. */
 TEST(SourceRuns, IndicesBeyond16BitsWrap) {
     EXPECT_EQ(indices_given(0x10000 + 3, 2), 0x10000 + 3);
-    EXPECT_EQ(indices_given(0x10000, NO_INDEX), 0x10000);
+    EXPECT_EQ(indices_given(0x10000, NO_SD_INDEX), 0x10000);
 }
 
 TEST(SourceRuns, TheLastElementsGoWithoutAnIndex) {
@@ -37,7 +38,7 @@ TEST(SourceRuns, StructuredBytesHaveNoDefault) {
 }
 
 TEST(SourceRuns, ADefinitionWithoutElementsIsNotLate) {
-    EXPECT_FALSE(comes_too_late({}, {}, NO_INDEX));
+    EXPECT_FALSE(comes_too_late({}, {}, NO_SD_INDEX));
 }
 
 } // namespace

@@ -160,23 +160,16 @@ void builder::add_records(node &to, node_kind kind, const cdb::class_tables &tab
         to.parts.push_back(record<Record>(kind, tables.section, at, tables));
 }
 
-/* A table of errors or dependencies at offset 0, where the class record is, has no place: only its count is known,
- * which is a field of the class. */
-template <class Record> std::size_t count_placed(const cdb::bytes &section, const cdb_ref_t &first, std::size_t count) {
-    std::size_t at = first.offset[0];
-    return at == 0 ? 0 : cdb::count_inside(section, at, count, sizeof(Record));
-}
-
 void builder::add_errors(node &to, const rsrc_class_t &rc, const cdb::class_tables &tables) {
     std::size_t at = rc.u_rc_errors.offset[0];
-    std::size_t count = count_placed<rsrc_error_t>(tables.section, rc.u_rc_errors, rc.rc_num_errors);
+    std::size_t count = cdb::count_placed(tables.section, rc.u_rc_errors, rc.rc_num_errors, sizeof(rsrc_error_t));
     for (std::size_t i = 0; i < count; ++i, at += sizeof(rsrc_error_t))
         to.parts.push_back(record<rsrc_error_t>(node_kind::error, tables.section, at, tables));
 }
 
 void builder::add_dependencies(node &to, const rsrc_class_t &rc, const cdb::bytes &section) {
     std::size_t at = rc.u_rc_depends.offset[0];
-    std::size_t count = count_placed<rsrc_depend_t>(section, rc.u_rc_depends, rc.rc_num_depends);
+    std::size_t count = cdb::count_placed(section, rc.u_rc_depends, rc.rc_num_depends, sizeof(rsrc_depend_t));
     for (std::size_t i = 0; i < count; ++i, at += sizeof(rsrc_depend_t)) {
         to.parts.push_back(record<rsrc_depend_t>(node_kind::dependency, section, at, {}));
         to.parts.back().name = std::to_string(section.record<rsrc_depend_t>(at).rd_class_ID);

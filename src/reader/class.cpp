@@ -4,6 +4,7 @@
 
 #include "format/sections.h"
 #include "reader/attributes.h"
+#include "reader/tables.h"
 
 namespace cdb {
 
@@ -84,12 +85,6 @@ void class_walk::walk_actions(const cdb_ref_t &table, std::size_t count, vx_uint
         out.expect_id(place, fields_of<rsrc_action_t>.front().name, section.number<vx_uint32_t>(offset), id);
         references.follow(place, section, offset, leading_fields_of<rsrc_action_t>, VX_UNKNOWN);
     }
-}
-
-/* A table of errors or dependencies whose place is 0 has no place: nothing is known of it but its count. */
-std::size_t count_placed(const bytes &section, const cdb_ref_t &table, std::size_t count, std::size_t size) {
-    std::size_t offset = table.offset[0];
-    return offset == 0 ? 0 : count_inside(section, offset, count, size);
 }
 
 /* The compiler makes none, so what identifies them is not known. */

@@ -263,8 +263,7 @@ void walker::show_class_tables(const cdb::resource_class &rc) {
     for (const cdb::side_table &table : std::span(cdb::side_tables).first(cdb::TABLES_OF_RECORDS)) {
         std::size_t at = (record.*table.ref).offset[0];
         record_at entry = {*table.record, section, at, rc.side_tables()};
-        /* At 0 stands the class: it is how a table says that it has no place. */
-        std::size_t count = at == 0 ? 0 : cdb::count_inside(section, at, record.*table.count, entry.format.size);
+        std::size_t count = cdb::count_placed(section, record.*table.ref, record.*table.count, entry.format.size);
         out.open_list({table.key, {}});
         for (std::size_t i = 0; i < count; ++i, entry.at += entry.format.size)
             show_record(entry, {}, std::string(table.title));

@@ -25,3 +25,10 @@ TEST(reader_tables, a_class_has_all_its_tables) {
     EXPECT_NE(tables.variety_lists.size(), 0U);
     EXPECT_NE(tables.sd_defs.size(), 0U);
 }
+
+TEST(reader_tables, records_are_counted_as_far_as_the_section_has_them) {
+    std::array<std::byte, 40> section = {};
+    EXPECT_EQ(cdb::count_placed(cdb::bytes(section, std::endian::native), {{8, 0}}, 3, 8), 3U);
+    EXPECT_EQ(cdb::count_placed(cdb::bytes(section, std::endian::native), {{24, 0}}, 3, 8), 2U);
+    EXPECT_EQ(cdb::count_placed(cdb::bytes(section, std::endian::native), {{0, 0}}, 3, 8), 0U);
+}

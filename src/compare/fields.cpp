@@ -3,8 +3,8 @@
 #include "compare/fields.h"
 
 #include "cdb_view.h"
-#include "text/append.h"
 #include "text/hex.h"
+#include "text/number.h"
 
 namespace compare {
 
@@ -15,12 +15,6 @@ std::string text_of_permission(std::uint32_t mask) {
         if (known.mask == mask)
             return {known.permission};
     return text_of_bits(mask, {});
-}
-
-std::string text_of_version(std::uint32_t number) {
-    std::string text;
-    text::appendf(text, "%u.%u.%u.%u", number >> 24, number >> 16 & 255, number >> 8 & 255, number & 255);
-    return text;
 }
 
 } // namespace
@@ -49,7 +43,7 @@ std::string text_of_number(std::uint32_t number, cdb::meaning as) {
     case cdb::meaning::ACTION_PROPERTIES:
         return text_of_bits(number, cdb::properties_of(as));
     case cdb::meaning::VERSION:
-        return text_of_version(number);
+        return text::dotted(number);
     case cdb::meaning::DATA_TYPE:
         return std::string(cdb::name_of(static_cast<vx_data_type_t>(number)));
     case cdb::meaning::VARIABLE_TYPE:

@@ -1,6 +1,7 @@
-/* number.cpp: numbers of floating point as text. */
+/* number.cpp: numbers as text. */
 
 #include "text/number.h"
+#include "text/append.h"
 #include "text/hex.h"
 
 #include <array>
@@ -38,6 +39,12 @@ std::string shortest(float number) {
 
 std::string shortest(double number) {
     return shortest_of<std::uint64_t>(number);
+}
+
+std::string dotted(std::uint32_t number) {
+    std::string text;
+    appendf(text, "%u.%u.%u.%u", number >> 24, number >> 16 & 0xFF, number >> 8 & 0xFF, number & 0xFF);
+    return text;
 }
 
 } // namespace text

@@ -1,7 +1,8 @@
-/* number.h: numbers of floating point as text. */
+/* number.h: numbers as text. */
 #ifndef CDGEN_TEXT_NUMBER_H
 #define CDGEN_TEXT_NUMBER_H
 
+#include <cstdint>
 #include <string>
 
 namespace text {
@@ -10,6 +11,9 @@ namespace text {
  * not 0 shows it: "nan(0x1)". */
 std::string shortest(float number);
 std::string shortest(double number);
+
+/* The four bytes of a number, the highest first, as a version is written: "1.2.3.4". */
+std::string dotted(std::uint32_t number);
 
 } // namespace text
 

@@ -6,6 +6,7 @@
 #include "format/sections.h"
 #include "text/append.h"
 #include "text/hex.h"
+#include "text/number.h"
 
 #include <chrono>
 
@@ -75,12 +76,6 @@ fact time(std::uint32_t seconds) {
     return w;
 }
 
-fact version(std::uint32_t number) {
-    word w;
-    text::appendf(w.text, "%u.%u.%u.%u", number >> 24, number >> 16 & 0xFF, number >> 8 & 0xFF, number & 0xFF);
-    return w;
-}
-
 fact name_in(std::span<const char *const> names, std::uint32_t number) {
     if (number < names.size())
         return word{names[number]};
@@ -127,7 +122,7 @@ fact fact_of(cdb::meaning as, std::uint32_t number) {
     case VARIABLE_TYPE:
         return name_in(vxVarStr, number);
     case VERSION:
-        return version(number);
+        return word{text::dotted(number)};
     case PLAIN:
     case NONE_IS_0:
     case NONE_IS_255:

@@ -5,7 +5,7 @@
 #include "cdef/source/error.h"
 #include "format/names.h"
 #include "language/fields.h"
-#include "text/append.h"
+#include "text/number.h"
 
 #include <array>
 #include <tuple>
@@ -62,12 +62,6 @@ std::string permission_text(std::uint32_t mask, const std::string &place) {
     no_source(place, "no permission letter stands for " + std::to_string(mask));
 }
 
-std::string version_text(std::uint32_t number) {
-    std::string text;
-    text::appendf(text, "%u.%u.%u.%u", number >> 24, number >> 16 & 255, number >> 8 & 255, number & 255);
-    return text;
-}
-
 std::string number_text(std::uint32_t number, cdb::meaning as, const std::string &place) {
     switch (as) {
     case SIGNED:
@@ -77,7 +71,7 @@ std::string number_text(std::uint32_t number, cdb::meaning as, const std::string
     case VARIABLE_TYPE:
         return vxVarStr[number];
     case VERSION:
-        return version_text(number);
+        return text::dotted(number);
     case PERMISSIONS:
         return permission_text(number, place);
     case CLASS_PROPERTIES:

@@ -15,6 +15,11 @@ TEST(text_number, shortest_reads_back) {
     EXPECT_EQ(text::shortest(-std::numeric_limits<float>::infinity()), "-inf");
 }
 
+TEST(text_number, dotted_starts_with_the_highest_byte) {
+    EXPECT_EQ(text::dotted(0x010203FF), "1.2.3.255");
+    EXPECT_EQ(text::dotted(0), "0.0.0.0");
+}
+
 TEST(text_number, nan_shows_sign_and_payload) {
     EXPECT_EQ(text::shortest(std::bit_cast<float>(0x7FC00000U)), "nan");
     EXPECT_EQ(text::shortest(std::bit_cast<float>(0xFFC00000U)), "-nan");

@@ -11,24 +11,18 @@ namespace compare {
 namespace {
 
 std::string text_of_permission(std::uint32_t mask) {
-    for (const valid_perms_t &known : perm_list)
-        if (known.mask == mask)
-            return {known.permission};
-    return text_of_bits(mask, {});
+    char letter = permission_letter(mask);
+    return letter == '\0' ? text_of_bits(mask, {}) : std::string{letter};
 }
 
 } // namespace
 
 std::string text_of_bits(std::uint32_t bits, std::span<const props_t> known) {
     std::string text;
-    for (const props_t &property : known) {
-        if ((bits & property.p) != property.p)
-            continue;
-        text += (text.empty() ? "" : "+") + std::string(property.s);
-        bits &= ~property.p;
-    }
-    if (bits != 0)
-        text += (text.empty() ? "" : "+") + text::hex(bits);
+    auto add = [&text](const std::string &name) { text += (text.empty() ? "" : "+") + name; };
+    std::uint32_t unknown = take_properties(bits, known, add);
+    if (unknown != 0)
+        add(text::hex(unknown));
     return text.empty() ? "none" : text;
 }
 

@@ -6,6 +6,7 @@
 #include "cdb.h"
 
 #include <iterator>
+#include <span>
 
 /* Data types: names, and the types they stand for. */
 inline constexpr const char *vxTypeStr[] = {
@@ -93,5 +94,27 @@ inline constexpr valid_perms_t perm_list[] = {
 };
 inline constexpr int num_perm_list = std::size(perm_list);
 inline constexpr vx_uint32_t DEFAULT_PERMISSION = 0x40; /* s: of an action without a Permission line */
+
+/* ---- Bits as spellings ------------------------------------------------------------------------------------------ */
+
+/* The letter of a permission; '\0' if no single letter has this mask. */
+constexpr char permission_letter(vx_uint32_t mask) {
+    for (const valid_perms_t &known : perm_list)
+        if (known.mask == mask)
+            return known.permission;
+    return '\0';
+}
+
+/* Passes the name of each property in the set to take(const char *), in the order of the table. Returns the bits that
+ * have no name. */
+template <class Take>
+constexpr vx_uint32_t take_properties(vx_uint32_t set, std::span<const props_t> known, Take take) {
+    for (const props_t &property : known)
+        if ((set & property.p) != 0) {
+            take(property.s);
+            set &= ~property.p;
+        }
+    return set;
+}
 
 #endif

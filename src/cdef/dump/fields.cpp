@@ -41,12 +41,8 @@ words properties(std::span<const props_t> table, std::uint32_t set) {
 
 words permissions(std::uint32_t set) {
     return names_of(set, [](std::uint32_t bit) {
-        const auto *found = std::find_if(std::begin(perm_list), std::end(perm_list),
-                                         [bit](const valid_perms_t &p) { return p.mask == bit; });
-        std::string letter;
-        if (found != std::end(perm_list))
-            letter = found->permission;
-        return letter;
+        char letter = permission_letter(bit);
+        return letter == '\0' ? std::string() : std::string{letter};
     });
 }
 

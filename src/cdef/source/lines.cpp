@@ -56,10 +56,10 @@ std::uint32_t number_without_line(cdb::meaning as, bool is_completed) {
 std::string permission_text(std::uint32_t mask, const std::string &place) {
     if (mask == 0)
         return std::string(NO_PERMISSION);
-    for (const valid_perms_t &known : perm_list)
-        if (known.mask == mask)
-            return {known.permission};
-    no_source(place, "no permission letter stands for " + std::to_string(mask));
+    char letter = permission_letter(mask);
+    if (letter == '\0')
+        no_source(place, "no permission letter stands for " + std::to_string(mask));
+    return {letter};
 }
 
 std::string number_text(std::uint32_t number, cdb::meaning as, const std::string &place) {
@@ -176,14 +176,10 @@ std::optional<std::string> plain_text(const stanza_line &line, const stanza_reco
 
 std::string properties_text(std::uint32_t bits, std::span<const props_t> known, const std::string &place) {
     std::string names;
-    for (const props_t &p : known) {
-        if ((bits & p.p) == 0)
-            continue;
-        names.append(names.empty() ? "" : ",").append(p.s);
-        bits &= ~p.p;
-    }
-    if (bits != 0)
-        no_source(place, "no property has bit " + std::to_string(bits));
+    std::uint32_t unknown =
+        take_properties(bits, known, [&](const char *name) { names.append(names.empty() ? "" : ",").append(name); });
+    if (unknown != 0)
+        no_source(place, "no property has bit " + std::to_string(unknown));
     return names;
 }
 

@@ -267,7 +267,9 @@ size_t fit_image(cdgen &cx) {
 
 namespace {
 
-void write_image(cdgen &cx) {
+/* Fills the image in the machine's own byte order. */
+void fill_image(cdgen &cx, char *image) {
+    cx.image.chp = image;
     cx.image.dsect_anchs = cx.image.chp + sizeof(orb_cdb_header_t);
     cx.image.dsect_idx = 0;
     cx.image.dsp = cx.image.dsect_anchs + sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.image.dsect_count);
@@ -277,17 +279,25 @@ void write_image(cdgen &cx) {
     if (cx.sections.rsrc_var_class_tbl.tbl_base != nullptr)
         add_rsrc_var_class_tbls(cx);
     write_header(cx);
-    flush_mapfile(cx);
 }
 
 } // namespace
 
 void bld_cdb(cdgen &cx) {
-    cx.image.chp = get_mapfile(cx, fit_image(cx));
+    char *image = get_mapfile(cx, fit_image(cx));
     try {
-        write_image(cx);
+        fill_image(cx, image);
+        flush_mapfile(cx);
     } catch (...) { /* before the message is printed */
         cx.output.discard();
         throw;
     }
+}
+
+std::vector<std::byte> image_in_memory(cdgen &cx) {
+    std::vector<std::byte> image(fit_image(cx));
+    cx.output.gross_file_size = image.size();
+    fill_image(cx, reinterpret_cast<char *>(image.data()));
+    image.resize(static_cast<size_t>(cx.image.dsp - cx.image.chp));
+    return image;
 }

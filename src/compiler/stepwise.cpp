@@ -76,6 +76,10 @@ void stepwise_compiler::size_image() {
     fit_image(cx);
 }
 
+std::vector<std::byte> stepwise_compiler::image() {
+    return image_in_memory(cx);
+}
+
 /* ---- State ----------------------------------------------------------------------------------------------------- */
 
 bool stepwise_compiler::is_open(int kind) const {

@@ -116,6 +116,12 @@ std::optional<bound> element_of(const bound &array, const class_plan &plan) {
     return bound{*element, plan.owners->is_own(plan.view.side_tables().strings, place)};
 }
 
+/* False if the only element of a bound leads to what is not the bound's own. */
+bool owns_element(const bound &array, const class_plan &plan) {
+    std::optional<bound> element = element_of(array, plan);
+    return !element || element->is_own;
+}
+
 wanted_bytes wanted_of(const bound &low, const bound &high, const class_plan &plan) {
     if (std::optional<wanted_bytes> wanted = wanted_in_cells(low, high))
         return *wanted;
@@ -144,8 +150,9 @@ range range_of(const class_plan &plan, const step &s) {
     bool array = cdb::is_array(attr.type());
     return {.type = attr.type(),
             .takes_line = is_number(cdb::element_type(attr.type())) && is_complete(attr),
-            .is_default = are_default(low, high),
+            .is_default = are_default(low, high) && owns_element(first, plan) && owns_element(second, plan),
             .is_untouched = are_untouched(low, high),
+            .keeps_bounds = is_number(attr.type()) || array,
             .has_none = !is_number(attr.type()) && !array && !low.present() && !high.present(),
             .wanted = wanted_of(first, second, plan)};
 }

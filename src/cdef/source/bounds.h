@@ -23,7 +23,8 @@ struct range {
     bool takes_line;   /* a Range line is accepted and has an effect */
     bool is_default;   /* the completion gives these bounds if no Range was given */
     bool is_untouched; /* an attribute that was given nothing has these bounds */
-    bool has_none;     /* bounds are not kept, or cannot be seen */
+    bool keeps_bounds; /* its completion does not take its bounds away */
+    bool has_none;     /* the bounds are absent, or cannot be seen */
     wanted_bytes wanted;
 };
 

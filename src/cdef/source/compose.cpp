@@ -7,6 +7,7 @@
 #include "cdef/source/groups.h"
 #include "cdef/source/lines.h"
 #include "cdef/source/order.h"
+#include "cdef/source/proof.h"
 #include "cdef/source/range.h"
 #include "cdef/source/stanza.h"
 #include "cdef/source/structure.h"
@@ -119,12 +120,8 @@ private:
     }
 
     void write_locator() {
-        std::uint16_t none = plan.is_last ? NO_LOCATOR : 0; /* a locator is looked up in the last class only */
-        if (rc.rc_locator == none)
-            return;
-        if (!plan.is_last || !has_all_required(rc))
-            no_source(from.place, "no line sets its locator");
-        out.line("Locator", locator_name(plan.view));
+        if (!plan.locator.empty())
+            out.line("Locator", plan.locator);
     }
 
     const class_plan &plan;
@@ -146,6 +143,21 @@ struct plain_stanza_writer {
     source_writer &out;
     stanza_record from;
 };
+
+/* A locator is looked up in the last class only, but a line in any class gives it: the latest that can have one. */
+void plan_locator(std::vector<class_plan> &plans) {
+    for (const class_plan &plan : plans)
+        if (!plan.is_last && plan.view.record().rc_locator != 0)
+            no_source(place_of("ResourceClass", plan.view.name()), "no line sets its locator");
+    const cdb::resource_class &last = plans.back().view;
+    if (last.record().rc_locator == NO_LOCATOR)
+        return;
+    auto giver = std::find_if(plans.rbegin(), plans.rend(),
+                              [](const class_plan &plan) { return has_all_required(plan.view.record()); });
+    if (giver == plans.rend())
+        no_source(place_of("ResourceClass", last.name()), "no line sets its locator");
+    giver->locator = locator_name(last);
+}
 
 void write_control_definition(source_writer &out, const cdb::resource_class &c) {
     std::string place = place_of("ResourceClass", c.name());
@@ -216,6 +228,12 @@ std::vector<class_plan> plans_of(const cdb::database &db, const cdb::ownership &
     }
     plan_ranges(plans);
     plan_variable_classes(plans, db);
+    plan_locator(plans);
+    for (class_plan &plan : plans) {
+        if (plan.ends_in_run)
+            plan.map_before = 0;
+        separate_runs(plan);
+    }
     return plans;
 }
 
@@ -226,12 +244,17 @@ void write_long_comment(source_writer &out, std::string_view text) {
         out.comment(text.substr(0, WIDTH));
 }
 
-void write_heading(source_writer &out, const std::vector<class_plan> &plans) {
-    out.comment(HEADING);
+/* The name of the classes that no line names: the compiler takes it from the output file. Nothing if there are none. */
+std::optional<std::string> default_name(const std::vector<class_plan> &plans) {
     std::optional<std::string> output;
     for (const class_plan &plan : plans)
         if (!can_be_named(plan.view))
             require_default_name(plan.view, output);
+    return output;
+}
+
+void write_heading(source_writer &out, const std::optional<std::string> &output) {
+    out.comment(HEADING);
     if (output)
         write_long_comment(out, "The class is called after the output file, which has to be " +
                                     text::quoted_ascii(*output + std::string(SUFFIX)) + ".");
@@ -250,21 +273,22 @@ std::vector<std::size_t> own_fields(stanza_id stanza) {
 std::string source_of(const cdb::database &db, const cdb::ownership &owners) {
     require_settable(db);
     std::vector<class_plan> plans = plans_of(db, owners);
-    bool map_first = plans.back().ends_in_run;
+    std::optional<std::string> output = default_name(plans);
     source_writer out;
-    write_heading(out, plans);
+    write_heading(out, output);
     for (const class_plan &plan : plans) {
         write_control_definition(out, plan.view);
         resource_class_writer(out, plan).write();
         if (&plan == &plans.front())
             for (const cdb::variable_class &v : db.variable_classes())
                 write_variable_class(out, v);
-        if (plan.is_last && map_first)
+        std::size_t end = plan.order.size(), map_before = plan.map_before.value_or(end);
+        write_steps(out, plan, 0, map_before);
+        if (plan.is_last)
             write_map(out, db);
-        write_steps(out, plan);
+        write_steps(out, plan, map_before, end);
     }
-    if (!map_first)
-        write_map(out, db);
+    require_equal(out.text, output.value_or("Class") + std::string(SUFFIX), db, owners);
     return out.text;
 }
 

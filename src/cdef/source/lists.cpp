@@ -22,7 +22,8 @@ std::vector<std::string> texts_of_pair(const cdb::valid_value &v) {
     std::vector<std::string> texts;
     for (const std::string &low : texts_of(v.low, true))
         for (const std::string &high : texts_of(v.high, false))
-            texts.push_back(std::string(low).append(",").append(high));
+            if (!low.empty() && !high.empty()) /* the compiler refuses an empty end */
+                texts.push_back(std::string(low).append(",").append(high));
     return texts;
 }
 

@@ -54,6 +54,21 @@ std::optional<traced_step> next_record(const std::array<std::vector<traces>, REC
     return next;
 }
 
+bool is_structured(const cdb::resource_class &c, const step &s) {
+    cdb::level level = level_of(s.from);
+    if (s.from == table::persistent_attributes || s.from == table::persistent_class_attributes)
+        return cdb::element_type(c.persistent_attributes(level)[s.index].type()) == VX_SD_PTR;
+    return is_dynamic(s.from) && cdb::element_type(c.dynamic_attributes(level)[s.index].type()) == VX_SD_PTR;
+}
+
+/* The last run for the class that directly follows an attribute of structured data or its run. */
+std::optional<std::size_t> last_misplaced_run(const class_plan &plan) {
+    for (std::size_t i = plan.order.size(); i-- > 1;)
+        if (plan.order[i].from == table::inputs && i != plan.map_before && is_structured(plan.view, plan.order[i - 1]))
+            return i;
+    return std::nullopt;
+}
+
 template <class Record> bool is_late(const cdb::attribute<Record> &attr, const cdb::value &value) {
     return cdb::element_type(attr.type()) == VX_SD_PTR &&
            comes_too_late(attr.structure(), value, attr.record().ra_max_sd_idx);
@@ -105,6 +120,18 @@ std::vector<step> order_of(const std::array<std::vector<traces>, RECORD_TABLES> 
 void plan_order(class_plan &plan) {
     plan.order = order_of(traces_of(plan.view), inputs_of(plan.view));
     put_last(plan);
+}
+
+/* The map stays at the end if the run of an attribute would end the file without it. */
+void separate_runs(class_plan &plan) {
+    while (std::optional<std::size_t> misplaced = last_misplaced_run(plan)) {
+        if (plan.is_last && !plan.map_before && !is_structured(plan.view, plan.order.back())) {
+            plan.map_before = misplaced;
+            continue;
+        }
+        auto run = plan.order.begin() + static_cast<std::ptrdiff_t>(*misplaced);
+        std::rotate(plan.order.begin(), run, run + 1);
+    }
 }
 
 } // namespace cdef::source

@@ -27,6 +27,11 @@ std::vector<step> order_of(const std::array<std::vector<traces>, RECORD_TABLES> 
  * The order matters little to a reader, but much to a Range, and for the same bytes. */
 void plan_order(class_plan &plan);
 
+/* Puts an ordinary stanza between an attribute of structured data, or its run, and a run for the class, because the
+ * compiler must not take the one for the other: the map, if its place is still open (map_before); otherwise the class's
+ * own, which the run then follows. Call it when the order is final. */
+void separate_runs(class_plan &plan);
+
 } // namespace cdef::source
 
 #endif

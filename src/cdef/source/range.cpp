@@ -112,7 +112,8 @@ ways completed(const ways &all, const range &r, bounds state::*held, bool cut_sh
         if (!w.is_open())
             continue;
         bool kept = w.at.*held == bounds::wanted || (w.at.*held == bounds::untouched && r.is_untouched);
-        bool has_bounds = cut_short ? kept : r.has_none || (w.at.given ? kept : r.is_default);
+        bool as_given = r.keeps_bounds && (w.at.given ? kept : r.is_default);
+        bool has_bounds = cut_short ? kept : r.has_none || as_given;
         w.at.*held = bounds::untouched;
         w.at.given = w.at.given && cut_short;
         if (has_bounds)

@@ -277,8 +277,8 @@ std::vector<std::size_t> own_attribute_fields(stanza_id stanza) {
     }
 }
 
-void write_steps(source_writer &out, const class_plan &plan) {
-    for (const step &s : plan.order)
+void write_steps(source_writer &out, const class_plan &plan, std::size_t first, std::size_t last) {
+    for (const step &s : std::span(plan.order).subspan(first, last - first))
         write_step(out, plan, s);
 }
 

@@ -8,6 +8,7 @@
 #include "reader/ownership.h"
 
 #include <array>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -98,6 +99,8 @@ struct class_plan {
     bool is_last = false; /* no class follows */
     std::vector<step> order;
     bool ends_in_run = false;                         /* the last step's run of SD stanzas ends the file */
+    std::optional<std::size_t> map_before;            /* index of the step before which the map is; none: at the end */
+    std::string locator;                              /* the value of a Locator line; empty: no line */
     std::array<std::vector<dynamic_plan>, 2> dynamic; /* by level */
 
     std::vector<dynamic_plan> &of(cdb::level level) {

@@ -256,7 +256,7 @@ def check_optional_fields(programs):
 
 def dynamic_class(fields, of_class=()):
     """The description of a class with dynamic attributes of the resource, behind some of the class, each with the
-    fields given. An empty text stands at 8 in the strings."""
+    fields given. An empty text is stored at 8 in the strings, an array of it at 16."""
     own = 224 + 136 * len(of_class)
     end = own + 136 * len(fields)
     lists = end + 16 * (len(of_class) + len(fields))
@@ -270,9 +270,9 @@ def dynamic_class(fields, of_class=()):
     ]
     marks = "8" * len(of_class) + "a" * len(fields)
     for i, given in enumerate([*of_class, *fields]):
-        lines.append(f"rsrc_dattr_t:{marks[i]} $DATTR u_ra_name={16 + 8 * i} u_ra_variety_list={16 * i}")
+        lines.append(f"rsrc_dattr_t:{marks[i]} $DATTR u_ra_name={32 + 8 * i} u_ra_variety_list={16 * i}")
         lines.append(f"+ ra_data_type=Int32 ra_max_value=Int32:100 {given}")
-    lines += ["variety_list_t:g 0,1"] * len(marks) + ['string "C"', 'string ""']
+    lines += ["variety_list_t:g 0,1"] * len(marks) + ['string "C"', 'string ""', "array String 8"]
     return "\n".join([*lines, *(f'string "A{i}"' for i in range(len(marks))), "include tail.inc", ""])
 
 
@@ -292,7 +292,9 @@ def check_choices_that_never_end(programs):
 def check_too_many_mixtures(programs):
     """Of many attributes of both kinds not all ways to mix them are tried; of a few they are."""
     problems = []
-    astray = "ra_data_type=String ra_init_value=String:8 ra_min_value=String:5 ra_max_value=String:6"
+    astray = (
+        "ra_data_type=StringArray ra_init_value=StringArray:16 ra_min_value=StringArray:5 ra_max_value=StringArray:6"
+    )
     few, many = (
         cdb_image.assemble(dynamic_class([astray] + [""] * (count - 1), [""] * count), base_dir=TESTS / "golden")
         for count in (3, 200)

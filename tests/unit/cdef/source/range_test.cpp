@@ -20,6 +20,7 @@ range int32(std::int32_t low, std::int32_t high) {
             .takes_line = true,
             .is_default = low == 0 && high == 100,
             .is_untouched = low == 0 && high == 0,
+            .keeps_bounds = true,
             .has_none = false,
             .wanted = {.known = true, .in_arrays = false, .width = 4, .low = cell_of(low), .high = cell_of(high)}};
 }
@@ -53,6 +54,16 @@ TEST(SourceRange, ALineOfAClassAttributeGoesToAnOpenResourceAttribute) {
     ASSERT_TRUE(found);
     EXPECT_EQ((*found)[0].of_resource, lines{"3,4"});
     EXPECT_EQ((*found)[0].of_class, lines{""});
+}
+
+/* Its completion takes away what a class attribute's line has left. */
+TEST(SourceRange, NothingGivesBoundsToACompletedAttributeThatKeepsNone) {
+    range text = int32(5, 6);
+    text.type = VX_CHAR_PTR;
+    text.takes_line = text.keeps_bounds = false;
+    EXPECT_FALSE(find_range_lines({attributes({int32(0, 0)}, {text}, {OF_RESOURCE, OF_CLASS})}));
+    text.has_none = true;
+    EXPECT_TRUE(find_range_lines({attributes({int32(0, 100)}, {text}, {OF_RESOURCE, OF_CLASS})}));
 }
 
 /* A class attribute keeps bounds of its own only if no resource attribute is open, so it has to come first. */

@@ -1,0 +1,94 @@
+/* proof.cpp: the proof that a source gives the database that it was made from. */
+
+#include "cdef/source/proof.h"
+
+#include "cdef/source/error.h"
+#include "compare/compare.h"
+#include "compare/text.h"
+#include "compiler/stepwise.h"
+#include "text/shown.h"
+
+#include <memory>
+#include <vector>
+
+namespace cdef::source {
+
+namespace {
+
+using compare::change;
+using compare::difference;
+using compare::node;
+
+struct no_observer final : line_observer {
+    void attribute_read(const attr_place &) override {}
+    bool excuses_missing(int) const override {
+        return false;
+    }
+};
+
+void take_lines(stepwise_compiler &compiler) {
+    for (;;) {
+        source_line line = compiler.next_line();
+        if (line.begin == nullptr)
+            return;
+        if (attr_text text = text_of(line); text.end != nullptr)
+            compiler.take_line(text);
+    }
+}
+
+std::vector<std::byte> compiled(std::string_view text, const std::string &output) {
+    no_observer observer;
+    auto compiler = std::make_unique<stepwise_compiler>("source", output.c_str(), observer);
+    compiler->open_bytes(text);
+    take_lines(*compiler);
+    compiler->close();
+    for (std::size_t step = 0; step < stepwise_compiler::closing_steps(); ++step)
+        compiler->take_closing_step(step);
+    return compiler->image();
+}
+
+std::string words_of_failure(const fatal_exit &failure) {
+    std::string words = failure.line == 0 ? "" : "line " + std::to_string(failure.line) + ": ";
+    for (const char *part : words_of(failure))
+        words += part;
+    return text::escaped(words);
+}
+
+/* "DynamicResourceAttribute 'A'": the innermost record or list entry that a difference is about. */
+std::string place_of(const difference &d) {
+    const node &innermost = *d.path.back();
+    return std::string(innermost.label()).append(innermost.name.empty() ? "" : " ").append(innermost.name);
+}
+
+std::string why_of(const difference &d) {
+    if (d.what == change::removed)
+        return "compiled again, it would be gone";
+    if (d.what == change::added)
+        return "compiled again, it would be new";
+    return "compiled again, its " + std::string(d.before->what->label()) + " would be " + d.after->text + ", not " +
+           d.before->text;
+}
+
+void require_same_meaning(const std::vector<std::byte> &image, const cdb::database &db, const cdb::ownership &owners) {
+    cdb::database again(image);
+    cdb::ownership owners_again(again, cdb::verify(again));
+    node before = compare::meaning_of(db, owners), after = compare::meaning_of(again, owners_again);
+    std::vector<difference> found = compare::differences(before, after);
+    if (!found.empty())
+        no_source(place_of(found.front()), why_of(found.front()));
+}
+
+} // namespace
+
+void require_equal(std::string_view text, const std::string &output, const cdb::database &db,
+                   const cdb::ownership &owners) {
+    try {
+        require_same_meaning(compiled(text, output), db, owners);
+    } catch (const fatal_exit &failure) {
+        no_source("database", "its source would not compile: " + words_of_failure(failure));
+    } catch (const compare::too_entangled &e) {
+        no_source("database", e.what());
+    }
+}
+
+} // namespace cdef::source

@@ -1,0 +1,71 @@
+/* The proof that a source gives the database that it was made from. */
+
+#include "cdef/source/proof.h"
+
+#include "cdef/source/error.h"
+#include "compiler/stepwise.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+struct no_observer final : line_observer {
+    void attribute_read(const attr_place &) override {}
+    bool excuses_missing(int) const override {
+        return false;
+    }
+};
+
+std::string source_with(const std::string &last_key) {
+    return "ControlDefinition\n\tFileVersion=1\n"
+           "ClassToManagerMapping\n\tResourceManager=M\n\tFirstKey=1\n\tLastKey=" +
+           last_key + "\n\tDescriptiveMessageSet=1\n";
+}
+
+std::vector<std::byte> compiled(const std::string &text) {
+    no_observer observer;
+    stepwise_compiler compiler("source", "C.cdef", observer);
+    compiler.open_bytes(text);
+    for (;;) {
+        source_line line = compiler.next_line();
+        if (line.begin == nullptr)
+            break;
+        compiler.take_line(text_of(line));
+    }
+    for (std::size_t step = 0; step < stepwise_compiler::closing_steps(); ++step)
+        compiler.take_closing_step(step);
+    return compiler.image();
+}
+
+/* What the proof says of a text as the source of a database with LastKey 9; empty if it is one. */
+std::string refusal_of(const std::string &text, const std::string &output = "C.cdef") {
+    std::vector<std::byte> image = compiled(source_with("9"));
+    cdb::database db(image);
+    cdb::ownership owners(db, {});
+    try {
+        cdef::source::require_equal(text, output, db, owners);
+    } catch (const cdef::source::no_source_error &e) {
+        return e.what();
+    }
+    return "";
+}
+
+TEST(SourceProof, SourceOfTheSameDatabaseIsOne) {
+    EXPECT_EQ(refusal_of(source_with("9")), "");
+}
+
+TEST(SourceProof, FirstDifferenceIsTheReason) {
+    EXPECT_EQ(refusal_of(source_with("8")),
+              "no source: ClassToManagerMapping: compiled again, its last key would be 8, not 9");
+}
+
+TEST(SourceProof, WhatIsGoneIsTheReason) {
+    EXPECT_EQ(refusal_of(source_with("9"), "D.cdef"), "no source: ResourceClass 'C': compiled again, it would be gone");
+}
+
+TEST(SourceProof, MessageOfTheCompilerIsTheReason) {
+    EXPECT_EQ(refusal_of(source_with("9") + "Nonsense\n"),
+              "no source: database: its source would not compile: line 8: Invalid table name: Nonsense");
+}
+
+} // namespace

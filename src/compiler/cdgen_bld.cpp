@@ -68,7 +68,7 @@ template <class Record> void store(char *to, const Record &record) {
 void flush_mapfile(cdgen &cx) {
     auto final_size = static_cast<off_t>(load<orb_cdb_header_t>(cx.image.chp).cdb_hdr_length) + 4;
     if (cx.options.swap_endianness)
-        cdgen_cdef_swap(cx.image.chp, cx.stray.nowhere);
+        cdgen_cdef_swap(cx.image.chp, cx.stray.nowhere, cx.stray.to_numbers);
     cx.output.finish(final_size);
 }
 
@@ -131,8 +131,8 @@ void note_nowhere(cdgen &cx, const rsrc_class_t &record, const char *at) {
         const stray_reference &stray = cx.stray.strays[cx.stray.strays_done];
         if (stray.rsrc_class != cx.image.dsect_idx)
             break;
-        cx.stray.nowhere.push_back(static_cast<size_t>(at - cx.image.chp) + (record.*stray.records).offset[0] +
-                                   stray.offset);
+        std::vector<size_t> &places = stray.to_numbers ? cx.stray.to_numbers : cx.stray.nowhere;
+        places.push_back(static_cast<size_t>(at - cx.image.chp) + (record.*stray.records).offset[0] + stray.offset);
     }
 }
 

@@ -10,18 +10,21 @@
 
 struct cdgen;
 
-/* A word of an attribute's record that looks like a reference but is not one. */
+/* A word of an attribute's record that looks like a reference but is not one, or that leads to an array of numbers
+ * where the record's type says an array of something else. */
 struct stray_reference {
     int rsrc_class; /* the class's position among all */
     cdb_ref_t rsrc_class_t::*records;
-    size_t offset; /* in that table of the class, bytes */
+    size_t offset;           /* in that table of the class, bytes */
+    bool to_numbers = false; /* it leads to such an array */
 };
 
 /* What the reversal cannot see in the image. */
 struct stray_references {
     std::vector<stray_reference> strays; /* by class */
     size_t strays_done = 0;              /* those whose class has been written */
-    std::vector<size_t> nowhere;         /* their places in the image, in bytes */
+    std::vector<size_t> nowhere;         /* places in the image, in bytes, of those that are no references */
+    std::vector<size_t> to_numbers;      /* and of those that lead to numbers; ascending */
 };
 
 /* The image is reached by copying: sections are not aligned. */

@@ -132,12 +132,14 @@ bool is_array_of_numbers(vx_data_type_t type) {
 void note_stray_range(cdgen &cx, const rsrc_dattr_t &attr, cdb_ref_t rsrc_class_t::*records) {
     vx_data_type_t type = attr.ra_data_type;
     bool refers = has_no_range(type) || is_vx_array(type);
-    bool sound = is_array_of_numbers(type) && is_array_of_numbers(cx.range.dattr_range_type);
+    bool given_array = is_array_of_numbers(cx.range.dattr_range_type);
+    bool sound = is_array_of_numbers(type) && given_array;
     if (attr.ra_cb_ID != CDB_ID_DATTR || cx.range.dattr_range_type == VX_UNKNOWN || !refers || sound)
         return;
     size_t record = staged_tbl(cx.staged.cb_rsrc_class.*records)->used();
+    bool to_numbers = is_vx_array(type) && given_array;
     for (size_t bound : {offsetof(rsrc_dattr_t, ra_min_value), offsetof(rsrc_dattr_t, ra_max_value)})
-        cx.stray.strays.push_back({cx.sections.rsrc_class_count, records, record + bound});
+        cx.stray.strays.push_back({cx.sections.rsrc_class_count, records, record + bound, to_numbers});
 }
 
 void init_dattr_tbl(cdgen &cx) {

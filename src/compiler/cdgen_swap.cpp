@@ -137,6 +137,13 @@ void swap_out_of_line(vx_uint32_t offset, vx_data_type_t type, swap_area &sbase_
     --sbase_p.nesting;
 }
 
+/* What its elements would lead to is not followed. */
+void swap_array_alone(vx_uint32_t offset, vx_data_type_t type, swap_area &sbase_p) {
+    unsigned nesting = std::exchange(sbase_p.nesting, swap_area::NESTING_MAX - 1);
+    swap_out_of_line(offset, type, sbase_p);
+    sbase_p.nesting = nesting;
+}
+
 /* ---- Records --------------------------------------------------------------------------------------------------- */
 
 /* The tables of one class. */
@@ -204,6 +211,7 @@ void swap_records(char *first, vx_uint32_t count, size_t size, std::uint16_t typ
 struct swap_section {
     char *start;
     size_t length;
+    cell_places to_numbers = {};
 
     /* size bytes from offset on lie inside. */
     bool holds(size_t offset, size_t size) const {
@@ -247,6 +255,7 @@ void swap_class(const swap_section &section) {
         return;
     auto rc = load<rsrc_class_t>(section.start);
     swap_area strings = section.area(rc.u_rc_strings, section.length);
+    strings.to_numbers = section.to_numbers;
     swap_area valid_vals = section.area(rc.u_rc_valid_vals, rc.rc_valval_size);
     swap_area variety_lists = section.area(rc.u_rc_variety_lists, rc.rc_varlist_size);
     swap_area sd_defs = section.area(rc.u_rc_sd_defs, rc.rc_sd_size);
@@ -362,7 +371,10 @@ void swap_value(char *value, vx_data_type_t type, swap_area &sbase_p) {
     default:
         if (!known_type(type))
             return;
-        swap_out_of_line(load_word(value), type, sbase_p);
+        if (sbase_p.to_numbers.holds(value))
+            swap_array_alone(load_word(value), type, sbase_p);
+        else
+            swap_out_of_line(load_word(value), type, sbase_p);
         swap_word(value);
     }
 }
@@ -425,7 +437,7 @@ void swap_depends(char *first, vx_uint32_t count, swap_area &sbase_p, swap_area 
                                      {sbase_p, vvbase_p, vlbase_p, sdbase_p});
 }
 
-void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere) {
+void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere, std::span<const size_t> to_numbers) {
     auto header = load<orb_cdb_header_t>(cdb_hdr_p);
     size_t file_size = size_t{header.cdb_hdr_length} + sizeof header.cdb_hdr_length;
     std::vector<vx_uint32_t> strays = hide_strays(cdb_hdr_p, nowhere);
@@ -435,7 +447,7 @@ void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere) {
     for (; n > 0; --n, anchor_p += sizeof(cdb_dsect_anchor_t)) {
         auto anchor = load<cdb_dsect_anchor_t>(anchor_p);
         if (file.holds(anchor.cda_offset, anchor.cda_length))
-            swap_section_of(anchor, {cdb_hdr_p + anchor.cda_offset, anchor.cda_length});
+            swap_section_of(anchor, {cdb_hdr_p + anchor.cda_offset, anchor.cda_length, {cdb_hdr_p, to_numbers}});
         swap_fields<cdb::cdb_dsect_anchor_fields>(anchor_p);
     }
     restore_strays(cdb_hdr_p, nowhere, strays);

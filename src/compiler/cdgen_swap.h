@@ -5,13 +5,25 @@
 
 #include "cdb.h"
 
+#include <algorithm>
 #include <cstddef>
 #include <span>
 #include <vector>
 
 /* Reverses the byte order of a finished image in place. nowhere: places in the image of words that look like references
- * and are not; they are reversed, but not followed. */
-void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere = {});
+ * and are not; they are reversed, but not followed. to_numbers: places, ascending, of references to arrays of numbers
+ * where the type says arrays of something else; what the elements would lead to is left alone. */
+void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere = {}, std::span<const size_t> to_numbers = {});
+
+/* Cells of an image, by their places in it, ascending. */
+struct cell_places {
+    const char *image = nullptr;
+    std::span<const size_t> places = {};
+
+    bool holds(const char *cell) const {
+        return std::binary_search(places.begin(), places.end(), static_cast<size_t>(cell - image));
+    }
+};
 
 /* A table that references lead into. Hands out each thing in it once, and only what lies inside. */
 class swap_area {
@@ -24,7 +36,8 @@ public:
 
     /* Values inside values, at most so many deep: recursion must end whatever a file says. (The compiler writes 4.) */
     static constexpr unsigned NESTING_MAX = 64;
-    unsigned nesting = 0; /* values being reversed */
+    unsigned nesting = 0;   /* values being reversed */
+    cell_places to_numbers; /* their arrays are reversed, but the elements are not followed */
 
 private:
     /* Bytes. The compiler starts lists, definitions and values on multiples of 8; multiples of 4 are accepted. */

@@ -5,7 +5,8 @@ compiler's option -s writes: reading the native file and turning it here must
 give the same bytes.  References are followed while everything is still native;
 a list, a definition or a value reached twice is turned once; a reference that
 does not lead into its own table, whole and on a multiple of four, is not
-followed, and neither is a value cell that nothing has filled.
+followed, and neither is a value cell that nothing has filled, nor
+an element of an array that is a bound.
 """
 
 import struct
@@ -25,6 +26,7 @@ class Reverser:
         self.mark = "<" if image[8:12] == b"1tmf" else ">"
         self.seen = set()
         self.depth = 0
+        self.depth_max = NESTING_MAX
 
     def get(self, at, width=4):
         """A native number."""
@@ -63,7 +65,7 @@ class Reverser:
             self.turn(8, at)
         elif kind in (9, 11) or 13 <= kind <= 22:
             offset = self.get(at)
-            if offset != 0 and self.depth < NESTING_MAX:  # 0 is the first name's place: the cell was never filled
+            if offset != 0 and self.depth < self.depth_max:  # 0 is the first name's place: the cell was never filled
                 self.depth += 1
                 self.out_of_line(offset, kind, strings)
                 self.depth -= 1
@@ -130,8 +132,11 @@ class Reverser:
         self.variety(self.get(at + 56), tables)
         self.valid(self.get(at + 64), kind, tables)
         self.definition(self.get(at + 72), tables)
-        for place in (32, 40, 48):
+        self.value(at + 32, kind, tables["strings"])
+        self.depth_max = 1  # elements of a bound may be numbers of another attribute's range
+        for place in (40, 48):
             self.value(at + place, kind, tables["strings"])
+        self.depth_max = NESTING_MAX
         self.turn(4, at, at + 4, *(at + place for place in (8, 16, 24, 56, 64, 72, 80, 88, 96, 104, 108, 120)))
         self.turn(2, *(at + place for place in (112, 114, 116, 118, 124, 126, 128, 130)))
 

@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <string>
@@ -53,6 +54,18 @@ protected:
     std::filesystem::path directory;
 };
 
+std::uint32_t word_at(const std::string &image, size_t at) {
+    std::uint32_t word = 0;
+    memcpy(&word, image.data() + at, sizeof word);
+    return word;
+}
+
+/* A word of an image, and of its reversal. */
+std::string turned_word(const std::string &image, size_t at) {
+    std::string word = image.substr(at, 4);
+    return {word.rbegin(), word.rend()};
+}
+
 /* The class's name is the first string; 8 and 16 lead into it, and as a binary's length would turn "IJKL" to "LKJI". */
 TEST_P(StrayRange, DoesNotTurnText) {
     std::string source = HEAD + attribute("DynamicResourceAttribute", GetParam(), "") +
@@ -74,5 +87,30 @@ TEST_P(StrayRange, DoesNotTurnText) {
 
 INSTANTIATE_TEST_SUITE_P(Types, StrayRange,
                          testing::Values("Binary", "StringArray", "BinaryArray", "SDArray", "RHArray"));
+
+class StrayArrayRange : public StrayRange {};
+
+/* The count, and of the element what the record's type has there: a word. 8 and 16, the first words of the elements,
+ * lead into the class's name, which must stay. */
+TEST_P(StrayArrayRange, IsReversedAsTheRecordSays) {
+    constexpr size_t CLASS = 80 + 16 * 3;
+    constexpr size_t BOUNDS =
+        CLASS + sizeof(rsrc_class_t) + sizeof(rsrc_dattr_t) + offsetof(rsrc_dattr_t, ra_min_value);
+    std::string source = HEAD + attribute("DynamicResourceAttribute", GetParam(), "") +
+                         attribute("DynamicClassAttribute", "Int64Array", "\tRange=73014444040,16\n") + TAIL;
+    std::string native = compiled(source, "-n"), turned = compiled(source, "-s");
+    EXPECT_EQ(count_of(turned, "ABCDEFGHIJKLMNOPQRSTUVWXYZ"), 1U);
+    size_t strings = CLASS + word_at(native, CLASS + offsetof(rsrc_class_t, u_rc_strings));
+    for (size_t bound : {BOUNDS, BOUNDS + sizeof(vx_value_t)}) {
+        size_t array = strings + word_at(native, bound);
+        EXPECT_EQ(word_at(native, array), 1U);
+        EXPECT_EQ(turned.substr(bound, 4), turned_word(native, bound));
+        EXPECT_EQ(turned.substr(array, 4), turned_word(native, array));
+        EXPECT_EQ(turned.substr(array + 8, 4), turned_word(native, array + 8));
+        EXPECT_EQ(turned.substr(array + 12, 4), native.substr(array + 12, 4));
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(Types, StrayArrayRange, testing::Values("StringArray", "BinaryArray", "SDArray", "RHArray"));
 
 } // namespace

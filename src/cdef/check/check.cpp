@@ -4,6 +4,7 @@
 
 #include "cdef/cdef.h"
 #include "cdef/support/failure.h"
+#include "cdef/support/input.h"
 #include "cdef/support/output.h"
 #include "report/report.h"
 
@@ -95,6 +96,8 @@ int check_all(const check_options &options) {
     bool read = true;
     for (const std::string &source : options.sources) {
         try {
+            if (is_database(source))
+                throw check::cannot_check(source + ": a database, not a source; 'cdef verify' checks databases");
             check::totals count;
             if (options.format == "text")
                 count = check_as_text(source, chosen(options));

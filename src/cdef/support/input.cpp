@@ -7,6 +7,11 @@
 #include <algorithm>
 #include <array>
 #include <cerrno>
+#include <cstring>
+#include <fcntl.h>
+#include <span>
+#include <string_view>
+#include <sys/stat.h>
 #include <unistd.h>
 
 namespace cdef {
@@ -47,7 +52,55 @@ std::vector<std::byte> contents_of(const std::string &path) {
     return contents;
 }
 
+bool has_format_word(std::span<const std::byte> contents) {
+    constexpr std::size_t PLACE = offsetof(orb_cdb_header_t, cdb_hdr_format);
+    constexpr std::array<std::string_view, 2> words = {"1tmf", "fmt1"}; /* little-endian, big-endian */
+    if (contents.size() < PLACE + sizeof(vx_uint32_t))
+        return false;
+    return std::any_of(words.begin(), words.end(), [&](std::string_view word) {
+        return std::memcmp(contents.data() + PLACE, word.data(), word.size()) == 0;
+    });
+}
+
+/* Closes a file when it is left. */
+struct open_file {
+    explicit open_file(int opened) : fd(opened) {}
+    open_file(const open_file &) = delete;
+    open_file &operator=(const open_file &) = delete;
+    ~open_file() {
+        if (fd >= 0)
+            close(fd);
+    }
+
+    int fd;
+};
+
+/* The first bytes from where a regular file will be read; none of any other file. */
+std::vector<std::byte> beginning_of(int fd) {
+    constexpr std::size_t ENOUGH = sizeof(orb_cdb_header_t);
+    struct stat st = {};
+    if (fstat(fd, &st) != 0 || !S_ISREG(st.st_mode))
+        return {};
+    std::vector<std::byte> contents(ENOUGH);
+    ssize_t got = pread(fd, contents.data(), contents.size(), lseek(fd, 0, SEEK_CUR));
+    contents.resize(got < 0 ? 0 : static_cast<std::size_t>(got));
+    return contents;
+}
+
 } // namespace
+
+bool is_text(const std::vector<std::byte> &contents) {
+    constexpr std::size_t BEGINNING = 1024;
+    auto end = contents.begin() + static_cast<std::ptrdiff_t>(std::min(contents.size(), BEGINNING));
+    return !contents.empty() && !has_format_word(contents) && std::find(contents.begin(), end, std::byte{0}) == end;
+}
+
+bool is_database(const std::string &path) {
+    if (path == "-")
+        return has_format_word(beginning_of(STDIN_FILENO));
+    open_file file(open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
+    return file.fd >= 0 && has_format_word(beginning_of(file.fd));
+}
 
 input::input(const std::string &path) : name(path), contents(contents_of(path)), db(contents) {}
 

@@ -21,6 +21,14 @@ struct input {
     cdb::database db;
 };
 
+/* Whether a file is a text rather than a database, however damaged: it has no format word, and no byte of its beginning
+ * is zero. */
+bool is_text(const std::vector<std::byte> &contents);
+
+/* Whether a file has the format word of a database. False for what cannot be read at a place, such as a pipe: nothing
+ * is taken from it. "-" is standard input. */
+bool is_database(const std::string &path);
+
 /* Throws failure unless the database's records and values can be relied on: its only errors may be a wrong checksum
  * and filling that is not zero. Returns its findings. */
 std::vector<cdb::finding> require_readable(const input &in);

@@ -34,6 +34,8 @@ struct verdict {
 
 verdict judge(const std::string &path, const verify_options &options) {
     input in(path);
+    if (is_text(in.contents))
+        throw failure(path + ": a text, not a database; 'cdef check' checks sources");
     verdict v = {.text = {}, .data = json::object()};
     v.data["file"] = path;
     v.data["sound"] = true;

@@ -201,6 +201,32 @@ class Input(unittest.TestCase):
         self.assertEqual((status, messages), (2, missing + "cdef: broken: Is a directory\n"))
         self.assertEqual([each["file"] for each in json.loads(text)], [WRONG])
 
+    def test_a_source_belongs_to_check(self):
+        for text, shown in (("ControlDefinition\n\tFileVersion=1\n", True), ("x", True), ("", False), ("x\0", False)):
+            with tempfile.TemporaryDirectory() as directory:
+                source = pathlib.Path(directory) / "a.cdefsrc"
+                source.write_text(text)
+                status, output, messages = verify(source)
+            expected = f"cdef: {source}: a text, not a database; 'cdef check' checks sources\n"
+            if shown:
+                self.assertEqual((status, output, messages), (2, "", expected))
+            else:
+                self.assertEqual((status, messages), (1, ""))
+                self.assertIn("[CDB101]", output)
+
+    def test_a_database_given_to_check_belongs_to_verify(self):
+        message = "cdef: {}: a database, not a source; 'cdef verify' checks databases\n"
+        for name in (SOUND, SOUND.replace("little", "big"), WRONG):
+            result = subprocess.run(
+                [PROGRAMS.cdef, "check", name], cwd=PROGRAMS.images, capture_output=True, text=True, check=False, timeout=60
+            )
+            self.assertEqual((result.returncode, result.stdout, result.stderr), (2, "", message.format(name)))
+        with open(PROGRAMS.images / SOUND, "rb") as file:
+            result = subprocess.run(
+                [PROGRAMS.cdef, "check", "-"], stdin=file, capture_output=True, text=True, check=False, timeout=60
+            )
+        self.assertEqual((result.returncode, result.stdout, result.stderr), (2, "", message.format("-")))
+
     def test_directory(self):
         self.assertEqual(verify("broken"), (2, "", "cdef: broken: Is a directory\n"))
 

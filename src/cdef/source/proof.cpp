@@ -36,22 +36,31 @@ void take_lines(stepwise_compiler &compiler) {
     }
 }
 
-std::vector<std::byte> compiled(std::string_view text, const std::string &output) {
-    no_observer observer;
-    auto compiler = std::make_unique<stepwise_compiler>("source", output.c_str(), observer);
-    compiler->open_bytes(text);
-    take_lines(*compiler);
-    compiler->close();
-    for (std::size_t step = 0; step < stepwise_compiler::closing_steps(); ++step)
-        compiler->take_closing_step(step);
-    return compiler->image();
-}
-
 std::string words_of_failure(const fatal_exit &failure) {
     std::string words = failure.line == 0 ? "" : "line " + std::to_string(failure.line) + ": ";
     for (const char *part : words_of(failure))
         words += part;
     return text::escaped(words);
+}
+
+std::vector<std::byte> image_of(stepwise_compiler &compiler, std::string_view text) {
+    compiler.open_bytes(text);
+    take_lines(compiler);
+    compiler.close();
+    for (std::size_t step = 0; step < stepwise_compiler::closing_steps(); ++step)
+        compiler.take_closing_step(step);
+    return compiler.image();
+}
+
+/* A failure's details may belong to the compiler, so they are read while there is one. */
+std::vector<std::byte> compiled(std::string_view text, const std::string &output) {
+    no_observer observer;
+    auto compiler = std::make_unique<stepwise_compiler>("source", output.c_str(), observer);
+    try {
+        return image_of(*compiler, text);
+    } catch (const fatal_exit &failure) {
+        no_source("database", "its source would not compile: " + words_of_failure(failure));
+    }
 }
 
 /* "DynamicResourceAttribute 'A'": the innermost record or list entry that a difference is about. */
@@ -84,8 +93,6 @@ void require_equal(std::string_view text, const std::string &output, const cdb::
                    const cdb::ownership &owners) {
     try {
         require_same_meaning(compiled(text, output), db, owners);
-    } catch (const fatal_exit &failure) {
-        no_source("database", "its source would not compile: " + words_of_failure(failure));
     } catch (const compare::too_entangled &e) {
         no_source("database", e.what());
     }

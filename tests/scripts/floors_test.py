@@ -81,3 +81,13 @@ def test_include_of_a_higher_floor_is_found(floors, monkeypatch, directory):
     assert list(floors.wrong_includes("text", [])) == [
         "src/text/low.h includes cdef/, which is no floor below text/"
     ]
+
+
+def test_subcommand_that_knows_another_is_found(floors, monkeypatch, directory):
+    (directory / "src/cdef/dump").mkdir(parents=True)
+    (directory / "src/cdef/dump/a.cpp").write_text('#include "cdef/dump/a.h"\n#include "cdef/support/b.h"\n')
+    (directory / "src/cdef/dump/c.cpp").write_text('#include "cdef/source/d.h"\n')
+    monkeypatch.setattr(floors, "ROOT", directory)
+    assert list(floors.acquainted_subcommands()) == [
+        "src/cdef/dump/c.cpp includes cdef/source/: subcommands do not know each other"
+    ]

@@ -16,8 +16,10 @@
 #include <algorithm>
 #include <array>
 #include <charconv>
+#include <cstddef>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <fcntl.h>
 #include <string>
 #include <sys/mman.h>
@@ -199,7 +201,27 @@ outcome compiled(const memory_file &source) {
     return run(cdgen_main, {"-n", source.path, all_files().output});
 }
 
+/* Whether the word that names the format is in the header, in either byte order. */
+bool has_format_word(const bytes &file) {
+    constexpr std::size_t AT = offsetof(orb_cdb_header_t, cdb_hdr_format);
+    if (file.size() < AT + 4)
+        return false;
+    std::string_view word(reinterpret_cast<const char *>(file.data()) + AT, 4);
+    return word == "fmt1" || word == "1tmf";
+}
+
+/* Text where a database is expected: no format word, and no zero byte in the first kilobyte. */
+bool is_text(const bytes &file) {
+    std::size_t beginning = std::min<std::size_t>(file.size(), 1024);
+    return !file.empty() && !has_format_word(file) && std::memchr(file.data(), 0, beginning) == nullptr;
+}
+
 void look_at_verify(const outcome &came, const bytes &image, const words &form) {
+    if (is_text(image)) {
+        fuzz::require(came.status == cdef::FAILED && came.out.empty(), "a text is verified");
+        fuzz::require(came.err.find("a text, not a database") != std::string::npos, "a text is not called one");
+        return;
+    }
     auto has = [&](const char *word) { return std::find(form.begin(), form.end(), word) != form.end(); };
     judgement is = judge(image);
     bool passes = has("--werror") ? !is.found : is.sound;
@@ -295,7 +317,12 @@ void expect_first(const json &findings, const std::string &message) {
         fuzz::fail("the compiler says " + message + ", check " + with_line);
 }
 
-void look_at_check(const outcome &came, const bytes & /*source*/, const words &form) {
+void look_at_check(const outcome &came, const bytes &source, const words &form) {
+    if (has_format_word(source)) {
+        fuzz::require(came.status == cdef::FAILED, "a database is checked");
+        fuzz::require(came.err.find("a database, not a source") != std::string::npos, "a database is not called one");
+        return;
+    }
     auto has = [&](const char *word) { return std::find(form.begin(), form.end(), word) != form.end(); };
     outcome compiler = compiled(all_files().first);
     bool compiles = compiler.status == 0;

@@ -53,7 +53,12 @@ totals source_check::run(const sink &to) {
     compiler.close();
     line.end_source();
     recover.close_all();
-    return found.hand_over(to);
+    return found.hand_over([&](finding &&each) {
+        line.find_in_file(each.at);
+        for (note &more : each.notes)
+            line.find_in_file(more.at);
+        to(std::move(each));
+    });
 }
 
 } // namespace

@@ -69,17 +69,37 @@ using warning_set = std::array<bool, WARNING_COUNT>;
 
 /* ---- Findings --------------------------------------------------------------------------------------------------- */
 
-/* A part of a line. */
+/* A part of a line. The compiler counts a line of the file several times if it is too long to be read at once. */
 struct place {
     int line = 0;      /* as the compiler counts lines; 0: none */
     size_t column = 0; /* in bytes, from 1; 0: the whole line */
     size_t length = 0; /* in bytes */
+    /* The same in the file, where a newline ends each line. Set once all of the source has been read. */
+    int file_line = 0;
+    size_t file_column = 0;
 };
 
 struct note {
     place at;
     std::string text;
     std::string source = {}; /* the line, where it has to be shown because the finding has no place in it */
+};
+
+/* A change of the source, at a place of the file. */
+struct edit {
+    int line = 0;         /* from 1, each ended by a newline */
+    size_t column = 0;    /* in bytes, from 1 */
+    size_t character = 0; /* the same in characters */
+    std::string removed;  /* the bytes there; a newline is the last one, if there is any */
+    std::string text;     /* what replaces them */
+};
+
+enum class certainty { likely, certain /* what else could be meant is not in sight */ };
+
+/* Edits that cure a finding together. They do not overlap. */
+struct correction {
+    certainty sure = certainty::likely;
+    std::vector<edit> edits; /* by place; empty: no cure is known that a program could apply */
 };
 
 struct finding {
@@ -90,6 +110,7 @@ struct finding {
     place at;
     std::string source; /* the line */
     std::vector<note> notes;
+    correction fix = {};
 };
 
 struct totals {

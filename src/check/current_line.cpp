@@ -2,6 +2,8 @@
 
 #include "check/current_line.h"
 
+#include "text/utf8.h"
+
 #include <algorithm>
 #include <cstring>
 #include <functional>
@@ -24,6 +26,8 @@ void current_line::read(const source_line &source, int line_number) {
     number = line_number;
     continues = fills_piece;
     fills_piece = raw.size() == LINE_MAX_CHARS;
+    if (continues)
+        rests.push_back(number);
 }
 
 /* Carriage returns are rare. Where the next one is, is found once for all that the buffer holds. */
@@ -71,6 +75,30 @@ place current_line::marked(mark_kind kind, const attr_place &attr, const char *i
     if (attr.attr != nullptr && attr.length > 0)
         return part_of(attr, 0, attr.length);
     return {number, equals + 2, after - (equals + 1)};
+}
+
+void current_line::find_in_file(place &at) const {
+    if (at.line == 0)
+        return;
+    auto after = std::upper_bound(rests.begin(), rests.end(), at.line);
+    at.file_line = at.line - static_cast<int>(after - rests.begin());
+    at.file_column = at.column;
+    int line = at.line;
+    for (; at.column != 0 && after != rests.begin() && after[-1] == line; --after, --line)
+        at.file_column += LINE_MAX_CHARS;
+}
+
+edit current_line::replacement(place part, std::string_view source, std::string_view by) const {
+    find_in_file(part);
+    size_t character = text::characters_in(source.substr(0, part.column - 1)) + 1;
+    return {part.file_line, part.column, character, std::string(source.substr(part.column - 1, part.length)),
+            std::string(by)};
+}
+
+correction current_line::renamed(const place &part, std::string_view source, const language::guess &meant) const {
+    if (meant.name.empty() || std::binary_search(rests.begin(), rests.end(), part.line))
+        return {};
+    return {meant.certain ? certainty::certain : certainty::likely, {replacement(part, source, meant.name)}};
 }
 
 } // namespace check

@@ -5,12 +5,14 @@
 #include "check/check.h"
 #include "compiler/cdgen_read.h"
 #include "language/limits.h"
+#include "language/suggestions.h"
 
 #include <array>
 #include <cstddef>
 #include <functional>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace check {
 
@@ -54,6 +56,15 @@ public:
         return raw.substr(part.column - 1, part.length);
     }
 
+    /* Says where in the file a place of this line, or of one before it, is. */
+    void find_in_file(place &at) const;
+    /* The change that puts a text in the place of a part of this line, or of one before it, of which it is given the
+     * text. The line is not the rest of one that is too long. */
+    edit replacement(place part, std::string_view source, std::string_view by) const;
+    /* The correction that puts the name that was meant in the place of a part of a line. None if there is no such name,
+     * or if the line is the rest of one that is too long. */
+    correction renamed(const place &part, std::string_view source, const language::guess &meant) const;
+
     /* Where in the line its first carriage return is; at or after its end if it has none. */
     size_t carriage_return() const {
         return static_cast<size_t>(next_return - begin);
@@ -81,6 +92,7 @@ private:
     std::array<char, 512> copy;        /* holds a replaced text */
     std::ptrdiff_t copy_added = 0;
     bool fills_piece = false;
+    std::vector<int> rests; /* numbers of the lines that are the rests of others */
 };
 
 } // namespace check

@@ -19,7 +19,7 @@ finding &findings::error(const message &known, const place &at, std::string_view
     return entries.back().found;
 }
 
-void findings::warn(const warning &known, const place &at, std::string_view source, std::string text, note more) {
+finding &findings::warn(const warning &known, const place &at, std::string_view source, std::string text, note more) {
     ++count.warnings;
     of_warning[known.id].push_back(entries.size());
     entries.push_back({{.error = false,
@@ -31,6 +31,7 @@ void findings::warn(const warning &known, const place &at, std::string_view sour
                         .notes = {}}});
     if (!more.text.empty())
         entries.back().found.notes.push_back(std::move(more));
+    return entries.back().found;
 }
 
 void findings::retract(warning_id id, int line) {

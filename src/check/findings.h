@@ -14,9 +14,9 @@ namespace check {
 
 class findings {
 public:
-    /* The finding is to be completed with notes before the next one is added. */
+    /* The finding is to be completed before the next one is added. */
     finding &error(const message &known, const place &at, std::string_view source, std::string text);
-    void warn(const warning &known, const place &at, std::string_view source, std::string text, note more);
+    finding &warn(const warning &known, const place &at, std::string_view source, std::string text, note more);
     /* Takes back the warnings of a line, which an error now explains. */
     void retract(warning_id id, int line);
 

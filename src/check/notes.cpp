@@ -55,6 +55,14 @@ struct noting {
     void show(const mention &shown, std::string text) {
         found.notes.push_back({shown.at, std::move(text), shown.source});
     }
+    /* What was meant takes the place of what is marked. */
+    void replace(const language::guess &meant) {
+        found.fix = see.line.renamed(found.at, found.source, meant);
+    }
+    void suggest(std::string_view given, const language::name_list &names) {
+        add_here(suggestion(given, names));
+        replace(language::meant_by(given, names));
+    }
     void first_given(int line) {
         if (line != 0)
             add({line, 0, 0}, "first given here");
@@ -103,7 +111,7 @@ void unknown_name(noting &n) {
     if (near_miss(given, known).empty() && others.count() == 1)
         n.add_here(belongs_to(others));
     else
-        n.add_here(suggestion(given, known));
+        n.suggest(given, known);
 }
 
 void too_early(noting &n) {
@@ -135,15 +143,16 @@ void second_map(noting &n) {
 }
 
 void unknown_property(noting &n) {
-    n.add_here(suggestion(n.marked(), language::property_names(n.see.attr().ta_type)));
+    n.suggest(n.marked(), language::property_names(n.see.attr().ta_type));
 }
 
 void unknown_type(noting &n) {
     n.add_here(language::type_suggestion(n.marked(), false));
+    n.replace(language::type_meant_by(n.marked(), false));
 }
 
 void unknown_variable_type(noting &n) {
-    n.add_here(suggestion(n.marked(), language::variable_type_names()));
+    n.suggest(n.marked(), language::variable_type_names());
 }
 
 void overflowed(noting &n) {

@@ -175,9 +175,11 @@ void recovery::unknown_header(const attr_text &text, const fatal_exit &failure) 
         return take_quietly(std::string("\t").append(name), 1);
     }
     add(language::suggestion(name, language::stanza_names()));
-    std::string_view meant = language::near_miss(front, language::stanza_names());
-    if (!meant.empty())
-        return take_header(line.replaced(meant), true);
+    language::guess meant = language::meant_by(front, language::stanza_names());
+    if (front.size() == name.size())
+        error.fix = line.renamed(line.all(), line.raw, meant);
+    if (!meant.name.empty())
+        return take_header(line.replaced(meant.name), true);
     lose_stanza();
 }
 

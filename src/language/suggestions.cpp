@@ -54,6 +54,10 @@ size_t distance(std::string_view a, std::string_view b, size_t limit) {
     return current[b.size()];
 }
 
+name_list named_types() {
+    return {std::begin(vxTypeStr) + 1, std::end(vxTypeStr)}; /* the first stands for none */
+}
+
 /* Types that have a name but are not accepted, anywhere or in an element. */
 bool is_refused(std::string_view type, bool element) {
     return type == "SBS" || (element && (type == "SD" || type == "SDArray"));
@@ -61,7 +65,7 @@ bool is_refused(std::string_view type, bool element) {
 
 } // namespace
 
-std::string_view near_miss(std::string_view text, const name_list &names) {
+guess meant_by(std::string_view text, const name_list &names) {
     if (text.size() > LONGEST_NAME)
         return {};
     std::string_view best;
@@ -75,7 +79,11 @@ std::string_view near_miss(std::string_view text, const name_list &names) {
             best = {}; /* as near as the one before */
         }
     }
-    return best;
+    return {best, !best.empty() && least <= 1};
+}
+
+std::string_view near_miss(std::string_view text, const name_list &names) {
+    return meant_by(text, names).name;
 }
 
 std::string suggestion(std::string_view text, const name_list &names) {
@@ -88,13 +96,18 @@ std::string suggestion(std::string_view text, const name_list &names) {
 }
 
 name_list data_type_names(bool element) {
-    name_list names = {std::begin(vxTypeStr) + 1, std::end(vxTypeStr)}; /* the first stands for none */
+    name_list names = named_types();
     std::erase_if(names, [&](std::string_view name) { return is_refused(name, element); });
     return names;
 }
 
+guess type_meant_by(std::string_view text, bool element) {
+    guess meant = meant_by(text, named_types());
+    return is_refused(meant.name, element) ? guess() : meant;
+}
+
 std::string type_suggestion(std::string_view text, bool element) {
-    std::string_view meant = near_miss(text, {std::begin(vxTypeStr) + 1, std::end(vxTypeStr)});
+    std::string_view meant = near_miss(text, named_types());
     if (meant.empty() || !is_refused(meant, element))
         return suggestion(text, data_type_names(element));
     if (meant == "SBS")

@@ -14,6 +14,15 @@ using name_list = std::vector<std::string_view>;
  * with a neighbour. Case does not count. Empty if no name is near enough, or if two are equally near. */
 std::string_view near_miss(std::string_view text, const name_list &names);
 
+/* What a text was meant to be. */
+struct guess {
+    std::string_view name; /* empty: nothing is like the text */
+    bool certain = false;  /* one edit makes the name of the text, and only this name */
+};
+
+/* The near miss of a text, and how sure it is. */
+guess meant_by(std::string_view text, const name_list &names);
+
 /* "did you mean `Name`?" if there is a near miss, or else "known are `Name` and `Id`"; empty if there are no names, or
  * too many to read. */
 std::string suggestion(std::string_view text, const name_list &names);
@@ -23,6 +32,9 @@ name_list data_type_names(bool element);
 
 /* As suggestion(), for a data type; for a text near a type that is not accepted it says so. */
 std::string type_suggestion(std::string_view text, bool element);
+
+/* The data type that a text was meant to be, if the compiler accepts it. */
+guess type_meant_by(std::string_view text, bool element);
 
 name_list variable_type_names();
 

@@ -63,9 +63,7 @@ std::string uri_of(std::string_view file) {
 }
 
 size_t characters_in(std::string_view source, size_t bytes) {
-    auto text = source.substr(0, bytes);
-    return static_cast<size_t>(
-        std::count_if(text.begin(), text.end(), [](char c) { return (static_cast<unsigned char>(c) & 0xC0) != 0x80; }));
+    return text::characters_in(source.substr(0, bytes));
 }
 
 } // namespace report

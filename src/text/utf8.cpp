@@ -38,6 +38,11 @@ bool is_utf8(std::string_view bytes) {
     return true;
 }
 
+std::size_t characters_in(std::string_view bytes) {
+    auto begins = [](char c) { return (static_cast<unsigned char>(c) & 0xC0) != 0x80; };
+    return static_cast<std::size_t>(std::count_if(bytes.begin(), bytes.end(), begins));
+}
+
 char32_t decode(std::string_view character) {
     auto lead = static_cast<unsigned char>(character[0]);
     if (character.size() == 1)

@@ -16,6 +16,9 @@ std::size_t length_or_1(std::string_view bytes);
 /* True if the text consists of well-formed characters. */
 bool is_utf8(std::string_view bytes);
 
+/* How many UTF-8 characters begin in a text. */
+std::size_t characters_in(std::string_view bytes);
+
 /* The code point of one whole character. */
 char32_t decode(std::string_view character);
 

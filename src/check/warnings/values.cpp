@@ -53,7 +53,8 @@ public:
         if (see.compiler.data_type() != VX_UNKNOWN || see.compiler.run_makes_value())
             return;
         place at = see.value_place();
-        report(see, at, "unknown data type: the element gets none", {at, language::type_suggestion(see.value(), true)});
+        report(see, at, "unknown data type: the element gets none", {at, language::type_suggestion(see.value(), true)},
+               see.line.renamed(at, see.line.raw, language::type_meant_by(see.value(), true)));
     }
 };
 

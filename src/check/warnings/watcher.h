@@ -57,12 +57,12 @@ public:
 
 protected:
     /* With a note, if it has a text. */
-    void report(const place &at, std::string_view source, std::string text, note more = {}) {
-        to.found.warn(to.known, at, source, std::move(text), std::move(more));
+    void report(const place &at, std::string_view source, std::string text, note more = {}, correction fix = {}) {
+        to.found.warn(to.known, at, source, std::move(text), std::move(more)).fix = std::move(fix);
     }
     /* About the current line. */
-    void report(const view &see, const place &at, std::string text, note more = {}) {
-        report(at, see.line.raw, std::move(text), std::move(more));
+    void report(const view &see, const place &at, std::string text, note more = {}, correction fix = {}) {
+        report(at, see.line.raw, std::move(text), std::move(more), std::move(fix));
     }
 
 private:

@@ -26,6 +26,12 @@ TEST(text_utf8, whole_texts) {
     EXPECT_FALSE(text::is_utf8("a\xC3"));
 }
 
+TEST(text_utf8, characters_in) {
+    EXPECT_EQ(text::characters_in(""), 0U);
+    EXPECT_EQ(text::characters_in("a\xC3\xA4z"), 3U);
+    EXPECT_EQ(text::characters_in("\x80z"), 1U);
+}
+
 TEST(text_utf8, decode) {
     EXPECT_EQ(text::decode("A"), U'A');
     EXPECT_EQ(text::decode("\xC3\xA4"), U'\u00E4');

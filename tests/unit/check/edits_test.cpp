@@ -1,0 +1,72 @@
+/* The edits that cure findings. */
+
+#include "check/current_line.h"
+#include "check/found_in.h"
+
+namespace {
+
+using found_in::CLASS;
+using found_in::findings_in;
+using found_in::persistent;
+
+/* "16:1(1) Actoin -> Action certain" for each edit: line, column, character. */
+std::string fixes_in(std::string_view source) {
+    std::string all;
+    for (const check::finding &found : findings_in(source))
+        for (const check::edit &each : found.fix.edits)
+            all += std::to_string(each.line) + ":" + std::to_string(each.column) + "(" +
+                   std::to_string(each.character) + ") " + each.removed + " -> " + each.text +
+                   (found.fix.sure == check::certainty::certain ? " certain" : " likely") + "\n";
+    return all;
+}
+
+TEST(Edits, CorrectEachKindOfName) {
+    EXPECT_EQ(fixes_in(CLASS + "PersistentResorceAttribute\n\tName=A\n\tDescripton=3\n\tDisplayName=4\n\tId=0\n"
+                               "\tDataType=string\n\tVarietyRange=1,1\n\tProperties=Public,Slect\n"),
+              "16:1(1) PersistentResorceAttribute -> PersistentResourceAttribute certain\n"
+              "18:2(2) Descripton -> Description certain\n"
+              "21:11(11) string -> String certain\n"
+              "23:20(20) Slect -> Select certain\n");
+    EXPECT_EQ(fixes_in(CLASS + found_in::element("OnlineSDDefinition", "In32")), "21:11(11) In32 -> Int32 certain\n");
+}
+
+TEST(Edits, AreLikelyFromTheSecondLetterOn) {
+    EXPECT_EQ(fixes_in(CLASS + persistent("A", "0", "Strnigg")), "21:11(11) Strnigg -> String likely\n");
+}
+
+TEST(Edits, DoNotNameATypeThatIsRefused) {
+    EXPECT_EQ(fixes_in(CLASS + persistent("A", "0", "SBSS")), "");
+}
+
+TEST(Edits, CountLinesAsTheFileDoes) {
+    std::string long_comment = "# " + std::string(600, 'x') + "\n";
+    EXPECT_EQ(fixes_in(long_comment + CLASS + persistent("A", "0", "Sting")), "22:11(11) Sting -> String certain\n");
+    EXPECT_EQ(fixes_in(CLASS + "#" + std::string(253, 'x') + "ResourceActoin\n"), "");
+}
+
+TEST(Edits, CountCharactersToo) {
+    std::string text = "\tName=\xC3\xA4.b\n";
+    char *mark = text.data() + text.size();
+    check::current_line line;
+    line.read({text.data(), text.data() + text.size() - 1, mark, mark}, 1);
+    check::edit made = line.replacement({1, 10, 1}, line.raw, "c");
+    EXPECT_EQ(made.column, 10u);
+    EXPECT_EQ(made.character, 9u);
+    EXPECT_EQ(made.removed, "b");
+}
+
+TEST(Places, AreThoseOfTheFileToo) {
+    check::place latest;
+    for (const check::finding &found : findings_in(CLASS + "#" + std::string(600, 'x') + "\nUnknwon\n")) {
+        latest = found.at;
+        if (latest.line == 17) { /* the second piece of the comment */
+            EXPECT_EQ(latest.file_line, 16);
+            EXPECT_EQ(latest.file_column, 255u);
+        }
+    }
+    EXPECT_EQ(latest.line, 19);
+    EXPECT_EQ(latest.file_line, 17);
+    EXPECT_EQ(latest.file_column, 1u);
+}
+
+} // namespace

@@ -59,14 +59,28 @@ struct refused_attributes {
     bool unknown_name = false;
 };
 
+/* Line of each attribute of a stanza, by its position in the kind; 0: not given. */
+using given_lines = std::array<int, ATTRS_MAX>;
+
 /* The latest stanza of a kind. */
 struct stanza_record {
+    bool is_empty() const {
+        return std::all_of(given.begin(), given.end(), [](int line) { return line == 0; });
+    }
+
     place header;
-    std::string source;                    /* the header's line */
-    std::array<int, ATTRS_MAX> given = {}; /* line of each attribute, by its position in the kind; 0: none */
+    std::string source; /* the header's line */
+    given_lines given = {};
+    bool repeated = false; /* a required attribute has been given again, and none for the first time since */
     refused_attributes refused;
     mention data_type;      /* the value of its DataType */
     bool misplaced = false; /* it seems to contain lines of another stanza */
+};
+
+/* An incomplete stanza, whose missing lines may be found in the stanza after it: a header may stand between them. */
+struct incomplete_stanza {
+    int kind = NO_KIND; /* NO_KIND: there is none, or the missing lines are elsewhere */
+    given_lines given = {};
 };
 
 /* Stanzas whose headers could not be understood. */
@@ -82,9 +96,9 @@ struct lost_stanzas {
 /* The latest run of elements. */
 struct element_run {
     int kind = SC_PATTR_SD_DEFINITION;
-    std::vector<mention> odd_types; /* DataTypes of elements for which the run's default may fail */
-    bool odd_type_reported = false; /* there were others, which have been reported */
-    int without_index = 0;          /* header line of the latest element without ElementIndex; 0: none */
+    std::vector<mention> odd_types;     /* DataTypes of elements for which the run's default may fail */
+    bool odd_type_reported = false;     /* there were others, which have been reported */
+    std::vector<mention> without_index; /* headers of elements without ElementIndex, since the latest wrong index */
 };
 
 /* Names and Ids that the current class gives, or for elements the current run. */
@@ -107,6 +121,7 @@ struct knowledge {
     bool skipping = false;     /* nothing of the current stanza can be understood */
     bool class_forged = false; /* the open class has no stanza */
     std::array<stanza_record, SC_COUNT> stanzas;
+    incomplete_stanza split; /* the stanza before the current one */
     lost_stanzas lost;
     element_run run;
     declarations declared;

@@ -181,8 +181,8 @@ void wrong_index(noting &n) {
         overflowed(n);
     else
         n.add_here("expected is " + std::to_string(n.see.compiler.expected_index()));
-    if (int line = n.see.known.run.without_index; line != 0)
-        n.add({line, 0, 0}, "this " + n.kind_name() + " lacks `ElementIndex`");
+    for (const mention &header : n.see.known.run.without_index)
+        n.show(header, lacks_index(n.kind));
 }
 
 void bad_default(noting &n) {
@@ -244,6 +244,10 @@ void add_notes(finding &found, const fatal_exit &failure, int kind, const view &
     for (const notes_of &each : table)
         if (each.id == failure.id)
             each.add(n);
+}
+
+std::string lacks_index(int kind) {
+    return "this " + quoted(table_of(kind).sc_name) + " lacks `ElementIndex`";
 }
 
 bool blames_overflow(const finding &found, const fatal_exit &failure, const view &see) {

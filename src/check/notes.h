@@ -5,6 +5,7 @@
 
 #include "check/view.h"
 
+#include <string>
 #include <string_view>
 
 namespace check {
@@ -14,6 +15,9 @@ void add_notes(finding &found, const fatal_exit &failure, int kind, const view &
 
 /* Whether a value was refused only because an earlier number overflowed, which the notes then say. */
 bool blames_overflow(const finding &found, const fatal_exit &failure, const view &see);
+
+/* The note for an element without ElementIndex. */
+std::string lacks_index(int kind);
 
 /* The value of an attribute of the ClassToManagerMapping; null if it was not given. */
 const mention *map_value(const knowledge &known, std::string_view attribute);

@@ -5,6 +5,8 @@
 #include "check/recovery.h"
 #include "language/names.h"
 
+#include <vector>
+
 namespace check {
 
 namespace {
@@ -44,9 +46,22 @@ void recovery::take_attribute() {
     if (compiler.latest().attr == nullptr)
         return;
     note_given();
+    settle_split();
     if (!known.stanza().misplaced)
         note_value();
     warned.attribute(see);
+}
+
+/* An attribute that the incomplete stanza before this one has as well, or cannot have, is none of its missing lines. */
+void recovery::settle_split() {
+    if (known.split.kind == NO_KIND || see.attr().dup_allowed != 0)
+        return;
+    const srtable_ctrl &table = table_of(known.split.kind);
+    const table_attrs *attr = find_attr(table, see.attr().ta_name);
+    if (attr != nullptr && known.split.given[static_cast<size_t>(attr - table.sc_attrs.data())] == 0)
+        return;
+    known.split = {};
+    known.stanza().misplaced = false;
 }
 
 /* ---- What is remembered of values ------------------------------------------------------------------------------ */
@@ -99,7 +114,9 @@ void recovery::recover_attribute(const fatal_exit &failure) {
         return lose_first_header(failure);
     const attr_place latest = compiler.latest();
     bool consequence = follows(failure);
-    if (!consequence && may_follow(failure)) {
+    if (!consequence && blames_element(failure)) {
+        report_element_without_index(failure);
+    } else if (!consequence && may_follow(failure)) {
         finding &error = report(failure, line.marked(message_of(failure.id).mark, latest, failure.detail1));
         add_notes(error, failure, known.kind, see);
         if (blames_overflow(error, failure, see))
@@ -173,7 +190,8 @@ bool recovery::follows(const fatal_exit &failure) {
 }
 
 /* Whether a line belongs to another stanza, as one before it did. The first such line is only noted: a second name, or
- * an attribute that other kinds have and this one has not. */
+ * an attribute that other kinds have and this one has not. Other required attributes that are repeated one after
+ * the other are the lines of one more stanza: the first of them has been reported. */
 bool recovery::is_misplaced(const fatal_exit &failure) {
     bool unknown = failure.id == MSG_UNKNOWN_ATTRIBUTE && !type_meant();
     bool repeated = failure.id == MSG_REPEATED_ATTRIBUTE;
@@ -182,7 +200,10 @@ bool recovery::is_misplaced(const fatal_exit &failure) {
         return unknown || repeated || failure.id == MSG_INVALID_VALUE || failure.id == MSG_NO_VALID_VALUE;
     bool first_attribute = compiler.latest().attr == table_of(known.kind).sc_attrs.data();
     bool named = repeated && (first_attribute || is_name(name_given()));
-    kind_set kinds = unknown || named ? language::kinds_with(name_given()) : kind_set();
+    bool required = repeated && (see.attr().req_bit & OPTIONAL) == 0;
+    bool again = required && known.stanza().repeated;
+    known.stanza().repeated = known.stanza().repeated || required;
+    kind_set kinds = unknown || named || again ? language::kinds_with(name_given()) : kind_set();
     before = kinds.any();
     if (!before)
         return false;
@@ -190,7 +211,30 @@ bool recovery::is_misplaced(const fatal_exit &failure) {
     index_lost = index_lost || is_sd_kind(known.kind); /* this may be another run */
     if (int previous = compiler.previous_kind(); unknown && previous >= 0)
         break_if_incomplete(previous); /* what it lacks may be here */
-    return false;
+    return again;
+}
+
+/* ---- Wrong indexes ---------------------------------------------------------------------------------------------- */
+
+/* Whether an index is wrong only because elements before it have none. An error of a line between them comes first, as
+ * the compiler prints it first. */
+bool recovery::blames_element(const fatal_exit &failure) const {
+    const std::vector<mention> &without = known.run.without_index;
+    if (failure.id != MSG_INDEX_NOT_CONSECUTIVE || without.empty() || error_line > without.front().at.line)
+        return false;
+    return compiler.element_index() - static_cast<long>(without.size()) == compiler.expected_index();
+}
+
+void recovery::report_element_without_index(const fatal_exit &failure) {
+    const std::vector<mention> &without = known.run.without_index;
+    finding &error = report(failure, without.front().at);
+    error.source = without.front().source;
+    for (const mention &header : without)
+        error.notes.push_back(
+            {header.at, lacks_index(known.kind), header.at.line == error.at.line ? "" : header.source});
+    error.notes.push_back({see.value_place(),
+                           "the compiler refuses this index: it expects " + std::to_string(compiler.expected_index()),
+                           std::string(line.raw)});
 }
 
 /* ---- What an error leaves to be done, besides its stanza's being broken ----------------------------------------- */
@@ -198,7 +242,9 @@ bool recovery::is_misplaced(const fatal_exit &failure) {
 void recovery::recover_value(const fatal_exit &failure, bool consequence) {
     if (failure.id == MSG_INDEX_NOT_CONSECUTIVE) {
         if (!consequence)
-            found.retract(INCOMPLETE, known.run.without_index);
+            for (const mention &header : known.run.without_index)
+                found.retract(INCOMPLETE, header.at.line);
+        known.run.without_index.clear();
         recover_index(consequence);
     }
     if (failure.id == MSG_NO_STRING_TABLE)

@@ -49,13 +49,14 @@ void recovery::take_header(const attr_text &text, bool guessed) {
     }
     bool no_index = loses_index(kind);
     errors_before_header = found.errors();
-    header_reported = splits_stanza = false;
+    header_reported = false;
+    known.split = {};
     for (int tries = 0; tries < HEADER_TRIES; ++tries) {
         try {
             compiler.take_line(text);
             warned.after_step(see, kind);
             open_stanza(kind, guessed || header_reported);
-            known.stanza().misplaced = splits_stanza;
+            known.stanza().misplaced = known.split.kind != NO_KIND;
             index_lost = index_lost || no_index;
             return;
         } catch (const fatal_exit &failure) {
@@ -82,7 +83,7 @@ void recovery::open_stanza(int kind, bool broken) {
         other_index = -1;
         known.run.odd_types.clear();
         known.run.odd_type_reported = false;
-        known.run.without_index = 0;
+        known.run.without_index.clear();
     }
     if (!is_sd_kind(kind))
         known.lost.owner = false;
@@ -93,6 +94,7 @@ void recovery::open_stanza(int kind, bool broken) {
     compiler.set_broken(kind, broken);
     stanza_record &stanza = known.stanza();
     stanza.given.fill(0);
+    stanza.repeated = false;
     stanza.refused = {};
     stanza.misplaced = false;
     stanza.data_type.at = {};
@@ -127,7 +129,8 @@ bool recovery::recover_completion(const fatal_exit &failure) {
     int failed = failed_kind(failure);
     if (!compiler.is_broken(failed) && !is_reported_otherwise(failure) && may_follow(failure))
         report_with_notes(failure, line.none(), failed);
-    splits_stanza = splits_stanza || (failed == known.kind && found.errors() > errors_before_header);
+    if (failed == known.kind && found.errors() > errors_before_header && !known.stanza().is_empty())
+        known.split = {failed, known.stanza().given};
     abandon(failed, failure);
     return true;
 }

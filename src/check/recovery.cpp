@@ -65,7 +65,7 @@ int recovery::failed_kind(const fatal_exit &failure) const {
 void recovery::end_stanza(int next_kind) {
     warned.stanza_end(see, next_kind);
     if (known.kind >= 0 && is_sd_kind(known.kind) && !lacking_unnoticed(see, next_kind).empty())
-        known.run.without_index = known.stanza().header.line;
+        known.run.without_index.push_back({known.stanza().header, {}, known.stanza().source});
 }
 
 /* Stanzas before the class, or without any, are checked in a class of their own. */
@@ -126,8 +126,10 @@ void recovery::note_given() {
         return;
     auto at = static_cast<size_t>(latest.attr - table_of(known.kind).sc_attrs.data());
     int &given = known.stanza().given[at];
-    if (given == 0)
+    if (given == 0) {
         given = line.number;
+        known.stanza().repeated = false;
+    }
     if (known.kind == SC_CLASS_TO_MANAGER_MAPPING)
         known.map_values.push_back({see.value_place(), latest.attr->ta_name, std::string(line.raw)});
     if (latest.attr->ta_type == AT_SD_INDEX)

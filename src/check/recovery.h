@@ -67,6 +67,7 @@ private:
 
     /* Attribute lines (recover_attribute.cpp). */
     void recover_attribute(const fatal_exit &failure);
+    void settle_split();
     void note_value();
     void declare();
     std::string_view header_meant(const fatal_exit &failure) const;
@@ -76,6 +77,8 @@ private:
     std::optional<int> type_meant() const;
     bool follows(const fatal_exit &failure);
     bool is_misplaced(const fatal_exit &failure);
+    bool blames_element(const fatal_exit &failure) const;
+    void report_element_without_index(const fatal_exit &failure);
     void recover_index(bool follows);
     void recover_value(const fatal_exit &failure, bool follows);
     void report_type_here();
@@ -91,7 +94,6 @@ private:
 
     size_t errors_before_header = 0; /* reported when the current header was met */
     bool header_reported = false;    /* as standing in a wrong place */
-    bool splits_stanza = false;      /* the stanza in front of the current header is incomplete */
     int error_line = 0;              /* of the latest error */
     bool strip_returns = false;
     bool index_lost = false; /* the next index of the run is not known */

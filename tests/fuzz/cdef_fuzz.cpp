@@ -305,6 +305,14 @@ std::string told(const std::string &text) {
     return json::parse(json(text).dump(-1, ' ', false, json::error_handler_t::replace)).get<std::string>();
 }
 
+/* The line in which the compiler met an error: a note has it if the error is reported where its cause is. */
+json line_of(const json &error) {
+    for (const json &note : error.at("notes"))
+        if (note.at("message").get<std::string>().starts_with("the compiler refuses this index"))
+            return note.at("line");
+    return error.at("line");
+}
+
 /* The first error is the compiler's. */
 void expect_first(const json &findings, const std::string &message) {
     auto first = std::find_if(findings.begin(), findings.end(), [](const json &f) { return f["severity"] == "error"; });
@@ -312,7 +320,7 @@ void expect_first(const json &findings, const std::string &message) {
     if (message.empty())
         return;
     std::string text = first->at("message");
-    std::string with_line = first->at("line").dump() + ": " + text;
+    std::string with_line = line_of(*first).dump() + ": " + text;
     if (told(message) != text && told(message) != with_line)
         fuzz::fail("the compiler says " + message + ", check " + with_line);
 }

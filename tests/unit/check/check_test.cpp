@@ -62,7 +62,59 @@ TEST(Recovery, ReportsAMisspeltPermissionAfterASecondName) {
 TEST(Recovery, ReportsAWarningNotBesideTheErrorThatExplainsIt) {
     std::string element = "DefineSDDefinition\n\tElementName=F\n\tDescription=5\n\tDisplayName=6\n\tDataType=Int32\n";
     EXPECT_EQ(found_in(CLASS + element), codes{"S515 16:1+18"});
-    EXPECT_EQ(found_in(CLASS + element + found_in::element("DefineSDDefinition", "Int32", "1")), codes{"S210 25:15+1"});
+    EXPECT_EQ(found_in(CLASS + element + found_in::element("DefineSDDefinition", "Int32", "1")), codes{"S210 16:1+18"});
+}
+
+TEST(Recovery, ReportsAWrongIndexAtTheElementsThatHaveNone) {
+    std::string none = "DefineSDDefinition\n\tElementName=F\n\tDescription=5\n\tDisplayName=6\n\tDataType=Int32\n";
+    std::string first = found_in::element("DefineSDDefinition", "Int32");
+    std::vector<check::finding> found =
+        findings_in(CLASS + first + none + none + found_in::element("DefineSDDefinition", "Int32", "3"));
+    ASSERT_EQ(found.size(), 3u);
+    EXPECT_EQ(found_in::shown(found[0]), "S210 22:1+18");
+    EXPECT_EQ(found_in::shown(found[1]), "S506 28:14+1"); /* the two are named F */
+    EXPECT_EQ(found_in::shown(found[2]), "S506 33:14+1"); /* and the others E */
+    EXPECT_EQ(found[0].source, "DefineSDDefinition");
+    ASSERT_EQ(found[0].notes.size(), 3u);
+    EXPECT_EQ(found[0].notes[0].at.line, 22);
+    EXPECT_EQ(found[0].notes[1].at.line, 27);
+    EXPECT_EQ(found[0].notes[2].at.line, 36);
+    EXPECT_EQ(found[0].notes[2].text, "the compiler refuses this index: it expects 1");
+}
+
+TEST(Recovery, ReportsAWrongIndexInItsLineIfElementsWithoutOneDoNotExplainIt) {
+    std::string none = "DefineSDDefinition\n\tElementName=F\n\tDescription=5\n\tDisplayName=6\n\tDataType=Int32\n";
+    EXPECT_EQ(found_in(CLASS + none + found_in::element("DefineSDDefinition", "Int32", "2")), codes{"S210 25:15+1"});
+    EXPECT_EQ(found_in(CLASS + none + "DefineSDDefinition\n\tElementNam=E\n\tElementIndex=1\n"),
+              (codes{"S106 22:2+10", "S210 23:15+1"}));
+}
+
+TEST(Recovery, RemembersTheNamesOfAStanzaAfterAnIncompleteOne) {
+    std::string incomplete = "PAttrSDDefinition\n\tElementName=E\n\tDescription=5\n\tDisplayName=6\n\tElementIndex=0\n";
+    std::string same = persistent("Q", "7", "Int32");
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "SD") + incomplete + same + same),
+              (codes{"S111 28", "S506 36:7+1", "S507 39:5+1"}));
+    std::string short_one = "PersistentResourceAttribute\n\tName=A\n\tDescription=3\n";
+    EXPECT_EQ(found_in(CLASS + short_one + same + same), (codes{"S111 19", "S506 27:7+1", "S507 30:5+1"}));
+}
+
+TEST(Recovery, RemembersNoNamesOfTheRestOfAStanza) {
+    std::string header = "PersistentResourceAttribute\n";
+    std::string rest = "\tName=Q\n\tDescription=3\n\tDisplayName=4\n\tId=7\n";
+    EXPECT_EQ(found_in(CLASS + persistent("Q", "7", "Int32") + header + "\tDataType=Int32\n\tVarietyRange=1,1\n" +
+                       header + rest),
+              (codes{"S111 26", "S111 30"}));
+}
+
+TEST(Recovery, ReportsALostHeaderOnce) {
+    std::string lost = "\tId=7\n\tDataType=Int32\n\tVarietyRange=1,1\n\tDescription=3\n\tDisplayName=4\n\tName=Q\n";
+    EXPECT_EQ(found_in(CLASS + persistent("P", "0", "Int32") + lost), codes{"S109 23:2+2"});
+}
+
+TEST(Recovery, ReportsTwoRepeatedAttributesThatAreApart) {
+    EXPECT_EQ(found_in(CLASS + "PersistentResourceAttribute\n\tName=P\n\tDescription=3\n\tDescription=3\n"
+                               "\tDisplayName=4\n\tId=0\n\tDataType=Int32\n\tDataType=Int32\n\tVarietyRange=1,1\n"),
+              (codes{"S109 19:2+11", "S109 23:2+8"}));
 }
 
 TEST(Recovery, ShowsAValueOfALineThatWasTakenAgain) {

@@ -33,19 +33,12 @@ public:
     }
 
     void after_step(const view &see, int next_kind) override {
-        bool of_resource = resource_was_open && is_completed(see, SC_DYNAMIC_RESOURCE_ATTRIBUTE, next_kind);
-        bool of_class = class_was_open && is_completed(see, SC_DYNAMIC_CLASS_ATTRIBUTE, next_kind);
-        if ((!of_resource && !of_class) || next_kind == SC_CONTROL_DEFINITION)
-            return;
-        int completed = of_resource ? SC_DYNAMIC_RESOURCE_ATTRIBUTE : SC_DYNAMIC_CLASS_ATTRIBUTE;
-        const lost_stanzas &lost = see.known.lost;
-        bool uncertain = lost.may_be(SC_DYNAMIC_RESOURCE_ATTRIBUTE) || lost.may_be(SC_DYNAMIC_CLASS_ATTRIBUTE);
-        std::string name = language::quoted(table_of(completed).sc_name);
-        for (const pending &range : ranges)
-            if (range.kind != completed && !uncertain)
-                report(range.at, range.source, "this Range is lost: a " + name + " is completed first",
-                       begun(see, completed));
-        ranges.clear();
+        if (next_kind == SC_CONTROL_DEFINITION) /* nothing is completed: the ranges stay */
+            return ranges.clear();
+        if (resource_was_open && is_completed(see, SC_DYNAMIC_RESOURCE_ATTRIBUTE, next_kind))
+            complete(see, SC_DYNAMIC_RESOURCE_ATTRIBUTE);
+        if (class_was_open && is_completed(see, SC_DYNAMIC_CLASS_ATTRIBUTE, next_kind))
+            complete(see, SC_DYNAMIC_CLASS_ATTRIBUTE);
     }
 
     /* An attribute that is not completed does not use its range. */
@@ -59,8 +52,24 @@ private:
     struct pending {
         place at;
         int kind;
-        std::string source; /* the line */
+        std::string source;    /* the line */
+        place cleared_by = {}; /* the header of the attribute whose completion cleared the mark, if one did */
     };
+
+    /* A record of a kind has been completed: with its range, unless the other kind has cleared the mark. */
+    void complete(const view &see, int kind) {
+        const lost_stanzas &lost = see.known.lost;
+        bool uncertain = lost.may_be(SC_DYNAMIC_RESOURCE_ATTRIBUTE) || lost.may_be(SC_DYNAMIC_CLASS_ATTRIBUTE);
+        int other = kind == SC_DYNAMIC_CLASS_ATTRIBUTE ? SC_DYNAMIC_RESOURCE_ATTRIBUTE : SC_DYNAMIC_CLASS_ATTRIBUTE;
+        for (pending &range : ranges)
+            if (range.kind == other && range.cleared_by.line == 0)
+                range.cleared_by = see.known.stanzas[index_of(kind)].header;
+            else if (range.kind == kind && range.cleared_by.line != 0 && !uncertain)
+                report(range.at, range.source,
+                       "this Range is lost: a " + language::quoted(table_of(other).sc_name) + " is completed first",
+                       {range.cleared_by, "begun here"});
+        std::erase_if(ranges, [&](const pending &range) { return range.kind == kind; });
+    }
 
     static note begun(const view &see, int kind) {
         return {see.known.stanzas[index_of(kind)].header, "begun here"};

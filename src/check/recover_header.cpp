@@ -116,7 +116,7 @@ bool recovery::recover_header(const fatal_exit &failure, int kind) {
     if (!consequence && may_follow(failure))
         report_with_notes(failure, line.all(), kind);
     if (no_attribute)
-        begin_stray_run(kind);
+        begin_stray_run(kind, !consequence || known.kind < 0 || known.stanza().misplaced);
     else if (failure.id == MSG_SECOND_MAP)
         give_up_map();
     else
@@ -143,12 +143,12 @@ bool recovery::recover_missing_class(const fatal_exit &failure, int kind) {
     return true;
 }
 
-/* The elements are checked although they belong to nothing. */
-void recovery::begin_stray_run(int kind) {
+/* The elements are checked although they belong to nothing. misplaced: the header may be the only line of an element */
+void recovery::begin_stray_run(int kind, bool misplaced) {
     open_placeholder_class();
     compiler.begin_ownerless_run(kind);
     open_stanza(kind, true);
-    known.stanza().misplaced = true;
+    known.stanza().misplaced = misplaced;
     index_lost = true;
 }
 

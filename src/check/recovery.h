@@ -59,7 +59,7 @@ private:
     bool recover_header(const fatal_exit &failure, int kind);
     bool recover_completion(const fatal_exit &failure);
     bool recover_missing_class(const fatal_exit &failure, int kind);
-    void begin_stray_run(int kind);
+    void begin_stray_run(int kind, bool misplaced);
     void give_up_map();
     void unknown_header(const attr_text &text, const fatal_exit &failure);
     std::optional<std::string> stripped_header(finding &found, std::string_view name);

@@ -250,6 +250,12 @@ TEST(ElementType, IsReportedWhereTheCompilerAcceptsIt) {
     EXPECT_EQ(found_in(CLASS + element("DefineSDDefinition", "Sting")), codes{"S513 21:11+5"});
 }
 
+TEST(ElementType, IsReportedAlthoughTheAttributeOfTheElementHasAnError) {
+    std::string broken = persistent("A", "0", "SD");
+    broken.replace(broken.find("DataType"), 8, "DataTyp ");
+    EXPECT_EQ(found_in(CLASS + broken + element("PAttrSDDefinition", "Sting")), (codes{"S106 21:2+8", "S513 28:11+5"}));
+}
+
 TEST(RangeElsewhere, IsReportedIfTheOtherKindIsOpen) {
     EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "A", "0") + dynamic(OF_CLASS, "B", "1", "\tRange=1,2\n")),
               codes{"S503 32:2+9"});
@@ -260,6 +266,12 @@ TEST(RangeElsewhere, IsReportedIfTheOtherKindIsCompletedFirst) {
                        dynamic(OF_CLASS, "C", "2")),
               codes{"S503 32:2+9"});
     EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "B", "1", "\tRange=1,2\n")), codes());
+}
+
+TEST(RangeElsewhere, IsNotReportedIfTheNextClassEndsTheAttribute) {
+    EXPECT_EQ(found_in(CLASS + dynamic(OF_CLASS, "A", "0") + dynamic(RESOURCE, "B", "1", "\tRange=1,2\n") +
+                       dynamic(OF_CLASS, "C", "2") + "ControlDefinition\n\tFileVersion=1\n"),
+              (codes{"S514 41:1+17", "S514 41:1+17", "S523 41:1+17"})); /* the next class has no ResourceClass */
 }
 
 } // namespace

@@ -26,6 +26,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
+#include <functional>
 #include <iterator>
 #include <optional>
 #include <span>
@@ -1161,6 +1162,12 @@ struct region {
  * of its size besides the findings. May throw std::bad_alloc.
  */
 std::vector<finding> verify(const database &db);
+
+/**
+ * The same, but hands over each finding as soon as it is made, so that they need not be in memory together: a damaged
+ * file may have many.
+ */
+void verify(const database &db, const std::function<void(finding &&)> &take);
 
 /**
  * True if there are no errors among the findings. There may be warnings. What the views show of a sound file can be

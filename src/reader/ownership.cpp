@@ -62,10 +62,13 @@ std::optional<std::size_t> owner_of_first_list(std::span<const suspect> suspects
     return owner && suspects[*owner].began < others.later_list ? owner : std::nullopt;
 }
 
-ownership::ownership(const database &db, std::span<const finding> findings) : start(db.file().raw().data()) {
-    for (const finding &f : findings)
-        if (f.broken->code == CODE_CUT_SHORT || f.broken->code == CODE_RANGE_ASTRAY)
-            strays.push_back(f.offset);
+std::optional<std::size_t> stray_of(const finding &f) {
+    bool is_stray = f.broken->code == CODE_CUT_SHORT || f.broken->code == CODE_RANGE_ASTRAY;
+    return is_stray ? std::optional(f.offset) : std::nullopt;
+}
+
+ownership::ownership(const database &db, std::vector<std::size_t> found)
+    : start(db.file().raw().data()), strays(std::move(found)) {
     std::sort(strays.begin(), strays.end());
 }
 

@@ -46,11 +46,15 @@ std::optional<std::size_t> owner_of_first_list(std::span<const suspect> suspects
 
 /* ---- The answer ------------------------------------------------------------------------------------------------ */
 
+/* The offset in the file of a reference or a cell that leads to what is not its record's own, if that is what verify()
+ * found. */
+std::optional<std::size_t> stray_of(const finding &f);
+
 /* Which references and value cells lead to what is their record's own. */
 class ownership {
 public:
-    /* findings: all that verify() finds in the database. */
-    ownership(const database &db, std::span<const finding> findings);
+    /* found: the strays among all that verify() finds in the database, in any order. */
+    ownership(const database &db, std::vector<std::size_t> found);
 
     /* offset: of the reference or the cell, in the file. */
     bool is_own(std::size_t offset) const {

@@ -13,7 +13,7 @@ void reporter::report(check broken, const location &at, std::string_view field, 
     const rule *rule = &rule_of(broken);
     if (excuse && rule->level == severity::error)
         rule = &rule_of(*excuse);
-    findings.push_back({rule, at.section, at.record, at.index, field, offset, std::move(found), std::move(expected)});
+    take({rule, at.section, at.record, at.index, field, offset, std::move(found), std::move(expected)});
 }
 
 void reporter::report(check broken, const location &at, std::string_view field, std::size_t offset, std::uint64_t found,

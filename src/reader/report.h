@@ -23,10 +23,13 @@ inline bool all_zero(std::span<const std::byte> stretch) {
     return word == 0 && std::all_of(stretch.begin(), stretch.end(), [](std::byte b) { return b == std::byte{0}; });
 }
 
+/* Is handed each finding when it is made. */
+using finding_taker = std::function<void(finding &&)>;
+
 class reporter {
 public:
     /* map: null if no regions are wanted. */
-    reporter(std::vector<finding> &to, std::vector<region> *map) : findings(to), regions(map) {}
+    reporter(const finding_taker &to, std::vector<region> *map) : take(to), regions(map) {}
 
     /* offset: in the file. */
     void report(check broken, const location &at, std::string_view field, std::size_t offset, std::string found,
@@ -77,7 +80,7 @@ private:
                          std::size_t file_offset);
     void add_regions(const location &at, const bytes &area, std::size_t offset, std::span<const field> fields);
 
-    std::vector<finding> &findings;
+    const finding_taker &take;
     std::vector<region> *regions;
 };
 

@@ -15,7 +15,7 @@ namespace {
 class file_walk {
 public:
     /* map: null if no regions are wanted. */
-    file_walk(const database &walked, std::vector<finding> &to, std::vector<region> *map)
+    file_walk(const database &walked, const finding_taker &to, std::vector<region> *map)
         : db(walked), out(to, map), last_class(find_last_class(walked)) {}
 
     void run();
@@ -147,9 +147,13 @@ void file_walk::run() {
 
 } // namespace
 
+void verify(const database &db, const std::function<void(finding &&)> &take) {
+    file_walk(db, take, nullptr).run();
+}
+
 std::vector<finding> verify(const database &db) {
     std::vector<finding> findings;
-    file_walk(db, findings, nullptr).run();
+    verify(db, [&findings](finding &&f) { findings.push_back(std::move(f)); });
     return findings;
 }
 
@@ -161,9 +165,9 @@ bool is_sound(std::span<const finding> findings) {
 /* In a damaged file two regions may overlap: the one that starts first counts, and of two that start together the
  * longer one. */
 std::vector<region> regions(const database &db) {
-    std::vector<finding> findings;
     std::vector<region> seen, all;
-    file_walk(db, findings, &seen).run();
+    finding_taker ignore = [](finding &&) {};
+    file_walk(db, ignore, &seen).run();
     std::stable_sort(seen.begin(), seen.end(), [](const region &a, const region &b) {
         return a.offset != b.offset ? a.offset < b.offset : a.size > b.size;
     });

@@ -87,7 +87,7 @@ json json_of(const difference &d) {
 
 node read(const std::string &path, std::unique_ptr<input> &in) {
     in = std::make_unique<input>(path);
-    cdb::ownership owners(in->db, require_readable_aloud(*in));
+    cdb::ownership owners = require_readable_aloud(*in).owners;
     try {
         return compare::meaning_of(in->db, owners);
     } catch (const compare::too_entangled &e) {

@@ -23,11 +23,11 @@ void run(const dump_options &options) {
     input in(options.file);
     if (options.as_hex)
         return dump::show_hex(in);
-    require_readable(in);
+    readability found = require_readable(in);
     if (options.as_json)
-        dump::show_json(in, options.with_offsets);
+        dump::show_json(in, found, options.with_offsets);
     else
-        dump::show_listing(in, options.with_offsets);
+        dump::show_listing(in, found, options.with_offsets);
 }
 
 } // namespace

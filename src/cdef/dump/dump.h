@@ -98,12 +98,12 @@ public:
 };
 
 /* Each shows a whole database on standard output; throws failure if that fails. */
-void show_listing(const input &in, bool with_offsets);
-void show_json(const input &in, bool with_offsets);
+void show_listing(const input &in, const readability &found, bool with_offsets);
+void show_json(const input &in, const readability &found, bool with_offsets);
 void show_hex(const input &in);
 
 /* Tells a sink all facts of a readable database. */
-void walk(const cdb::database &db, sink &to, bool with_offsets);
+void walk(const cdb::database &db, const readability &found, sink &to, bool with_offsets);
 
 } // namespace cdef::dump
 

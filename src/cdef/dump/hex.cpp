@@ -4,7 +4,7 @@
 #include "text/hex.h"
 #include "cdef/dump/dump.h"
 #include "cdef/support/output.h"
-#include "reader/ownership.h"
+#include "reader/owners.h"
 #include "reader/tables.h"
 #include "text/append.h"
 #include "text/shown.h"
@@ -26,7 +26,7 @@ bool starts(const cdb::region &r, std::string_view record) {
 class hex_form {
 public:
     explicit hex_form(const cdb::database &shown)
-        : db(shown), owners(shown, cdb::verify(shown)), sections(shown.section_count()) {}
+        : db(shown), owners(cdb::owners_in(shown)), sections(shown.section_count()) {}
 
     void show();
 

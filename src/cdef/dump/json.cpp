@@ -143,9 +143,9 @@ private:
 
 } // namespace
 
-void show_json(const input &in, bool with_offsets) {
+void show_json(const input &in, const readability &found, bool with_offsets) {
     json_form to;
-    walk(in.db, to, with_offsets);
+    walk(in.db, found, to, with_offsets);
     to.out.flush();
 }
 

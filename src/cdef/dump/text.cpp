@@ -109,9 +109,9 @@ std::string as_text(const fact &f) {
     return std::visit([](const auto &some) { return text_of(some); }, f);
 }
 
-void show_listing(const input &in, bool with_offsets) {
+void show_listing(const input &in, const readability &found, bool with_offsets) {
     listing to(wants_colour());
-    walk(in.db, to, with_offsets);
+    walk(in.db, found, to, with_offsets);
     to.out.flush();
 }
 

@@ -31,11 +31,10 @@ named found_in(const named_by_number &known, std::uint32_t number) {
 
 class walker {
 public:
-    walker(const cdb::database &walked, const std::vector<cdb::finding> &findings, sink &to, bool offsets)
-        : db(walked), out(to), with_offsets(offsets), owners(walked, findings) {
-        for (const cdb::finding &f : findings)
-            if (f.broken->code == cdb::CODE_CHECKSUM)
-                sum = {f.found, f.expected};
+    walker(const cdb::database &walked, const readability &found, sink &to, bool offsets)
+        : db(walked), out(to), with_offsets(offsets), owners(found.owners) {
+        if (std::optional<cdb::finding> wrong = found.first_of(cdb::CODE_CHECKSUM))
+            sum = {wrong->found, wrong->expected};
     }
 
     void show_file();
@@ -65,7 +64,7 @@ private:
     sink &out;
     bool with_offsets;
     checksum sum;
-    cdb::ownership owners;
+    const cdb::ownership &owners;
     /* Of several with one number, the first. */
     named_by_number variables; /* dynamic attributes, by variable ID */
     named_by_number managers;
@@ -325,8 +324,8 @@ void walker::show_file() {
 
 } // namespace
 
-void walk(const cdb::database &db, sink &to, bool with_offsets) {
-    walker(db, cdb::verify(db), to, with_offsets).show_file();
+void walk(const cdb::database &db, const readability &found, sink &to, bool with_offsets) {
+    walker(db, found, to, with_offsets).show_file();
 }
 
 } // namespace cdef::dump

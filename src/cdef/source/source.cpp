@@ -31,7 +31,7 @@ bool is_harmless(std::string_view text) {
 
 int run(const std::string &path) {
     input in(path);
-    cdb::ownership owners(in.db, require_readable_aloud(in));
+    cdb::ownership owners = require_readable_aloud(in).owners;
     std::string text;
     try {
         text = source::source_of(in.db, owners);

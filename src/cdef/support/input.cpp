@@ -104,22 +104,35 @@ bool is_database(const std::string &path) {
 
 input::input(const std::string &path) : name(path), contents(contents_of(path)), db(contents) {}
 
-std::vector<cdb::finding> require_readable(const input &in) {
-    std::vector<cdb::finding> findings = cdb::verify(in.db);
-    if (!std::all_of(findings.begin(), findings.end(), tolerable))
-        throw failure(in.name + ": not a sound database; 'cdef verify' says why");
-    return findings;
+std::optional<cdb::finding> readability::first_of(std::string_view code) const {
+    auto found =
+        std::find_if(errors.begin(), errors.end(), [code](const cdb::finding &f) { return f.broken->code == code; });
+    return found == errors.end() ? std::nullopt : std::optional(*found);
 }
 
-std::vector<cdb::finding> require_readable_aloud(const input &in) {
-    std::vector<cdb::finding> findings = require_readable(in);
-    for (std::string_view code : tolerated) {
-        auto found = std::find_if(findings.begin(), findings.end(),
-                                  [code](const cdb::finding &f) { return f.broken->code == code; });
-        if (found != findings.end())
-            print_error(in.name + ": " + std::string(found->broken->title));
-    }
-    return findings;
+/* There may be millions of findings, of which few matter. */
+readability require_readable(const input &in) {
+    std::vector<std::size_t> strays;
+    std::vector<cdb::finding> errors;
+    cdb::verify(in.db, [&](cdb::finding &&f) {
+        if (!tolerable(f))
+            throw failure(in.name + ": not a sound database; 'cdef verify' says why");
+        if (std::optional<std::size_t> stray = cdb::stray_of(f))
+            strays.push_back(*stray);
+        bool is_new = std::none_of(errors.begin(), errors.end(),
+                                   [&f](const cdb::finding &known) { return known.broken == f.broken; });
+        if (f.broken->level == cdb::severity::error && is_new)
+            errors.push_back(std::move(f));
+    });
+    return {cdb::ownership(in.db, std::move(strays)), std::move(errors)};
+}
+
+readability require_readable_aloud(const input &in) {
+    readability found = require_readable(in);
+    for (std::string_view code : tolerated)
+        if (std::optional<cdb::finding> first = found.first_of(code))
+            print_error(in.name + ": " + std::string(first->broken->title));
+    return found;
 }
 
 } // namespace cdef

@@ -3,8 +3,11 @@
 #define CDGEN_CDEF_INPUT_H
 
 #include "cdb_view.h"
+#include "reader/ownership.h"
 
+#include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace cdef {
@@ -29,13 +32,21 @@ bool is_text(const std::vector<std::byte> &contents);
  * is taken from it. "-" is standard input. */
 bool is_database(const std::string &path);
 
+/* What verification says of a database that can be read. */
+struct readability {
+    cdb::ownership owners;
+    std::vector<cdb::finding> errors; /* the first of each of the rules that it breaks all the same */
+
+    std::optional<cdb::finding> first_of(std::string_view code) const;
+};
+
 /* Throws failure unless the database's records and values can be relied on: its only errors may be a wrong checksum
- * and filling that is not zero. Returns its findings. */
-std::vector<cdb::finding> require_readable(const input &in);
+ * and filling that is not zero. */
+readability require_readable(const input &in);
 
 /* The same, and reports on standard error which of these two errors it has, each once: for subcommands whose output
  * does not show it. */
-std::vector<cdb::finding> require_readable_aloud(const input &in);
+readability require_readable_aloud(const input &in);
 
 } // namespace cdef
 

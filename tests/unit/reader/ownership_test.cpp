@@ -133,10 +133,15 @@ cdb::finding at(const cdb::rule &broken, std::size_t offset) {
     return {&broken, 0, {}, 0, {}, offset, {}, {}};
 }
 
-TEST(Ownership, WhatTwoRulesReportIsNotOwn) {
+TEST(Ownership, StraysAreWhatTwoRulesReport) {
+    EXPECT_EQ(cdb::stray_of(at(CUT_SHORT, 48)), 48);
+    EXPECT_EQ(cdb::stray_of(at(ASTRAY, 16)), 16);
+    EXPECT_EQ(cdb::stray_of(at(OTHER, 24)), std::nullopt);
+}
+
+TEST(Ownership, StraysAreNotOwn) {
     const std::array<std::byte, 64> file = {};
-    const cdb::finding findings[] = {at(CUT_SHORT, 48), at(ASTRAY, 16), at(OTHER, 24)};
-    const cdb::ownership owners(cdb::database(file), findings);
+    const cdb::ownership owners(cdb::database(file), {48, 16});
     EXPECT_FALSE(owners.is_own(16));
     EXPECT_FALSE(owners.is_own(48));
     EXPECT_TRUE(owners.is_own(24));
@@ -145,8 +150,7 @@ TEST(Ownership, WhatTwoRulesReportIsNotOwn) {
 TEST(Ownership, KnowsPartsOfTheDatabase) {
     const std::array<std::byte, 64> file = {};
     const cdb::database db(file);
-    const cdb::finding findings[] = {at(CUT_SHORT, 48)};
-    const cdb::ownership owners(db, findings);
+    const cdb::ownership owners(db, {48});
     EXPECT_FALSE(owners.is_own(db.file().part(40), 8));
     EXPECT_TRUE(owners.is_own(db.file().part(40), 0));
     EXPECT_TRUE(owners.is_own(cdb::bytes(), 48));

@@ -71,7 +71,7 @@ TEST_P(StrayRange, DoesNotTurnText) {
     std::string source = HEAD + attribute("DynamicResourceAttribute", GetParam(), "") +
                          attribute("DynamicClassAttribute", "Int32", "\tRange=8,16\n");
     bool is_binary = GetParam() == std::string("Binary");
-    for (size_t classes : {1, 2}) {    /* completed, and cut short by another class */
+    for (size_t classes : {1U, 2U}) {  /* completed, and cut short by another class */
         if (is_binary && classes == 1) /* whose completion leaves it without bounds */
             continue;
         std::string whole = source + (classes == 2 ? HEAD : "") + TAIL;

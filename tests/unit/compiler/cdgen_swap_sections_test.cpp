@@ -482,7 +482,7 @@ TEST(SwapImage, ReadInTheOtherOrderFrameIsTheSameAndTheChecksumHolds) {
     for (size_t at = 8; at < reversed.bytes.size(); at += 4)
         sum ^= other_order(reversed, at);
     EXPECT_EQ(other_order(reversed, 4), sum);
-    for (size_t at : {0, 8, 24, 80, 84, 88, 92, 96, 100, 104, 108})
+    for (size_t at : {0U, 8U, 24U, 80U, 84U, 88U, 92U, 96U, 100U, 104U, 108U})
         EXPECT_EQ(other_order(reversed, at), given.word(at)) << at;
 }
 

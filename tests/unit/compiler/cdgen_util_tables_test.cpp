@@ -221,7 +221,7 @@ const tbl_content *filed(cdgen &cx, size_t length) {
 }
 
 TEST_F(Tables, FiledOnesKeepWhatTheyHold) {
-    for (size_t length : {1, 32, 256, 257, 100000}) { /* up to 256: without a block of their own */
+    for (size_t length : {1U, 32U, 256U, 257U, 100000U}) { /* up to 256: without a block of their own */
         const tbl_content *content = filed(cx, length);
         const tbl_content *next = filed(cx, length); /* leaves the one before it alone */
         EXPECT_NE(content, next);

@@ -244,9 +244,9 @@ inline void put_ref(image &to, std::size_t at, std::size_t offset) {
 
 /* A class record without records and inputs. */
 inline void put_class(image &to, std::size_t at, const class_sizes &sizes) {
-    for (std::size_t place : {24, 32, 40, 48, 96, 104, 112, 120}) /* tables of records */
+    for (std::size_t place : {24U, 32U, 40U, 48U, 96U, 104U, 112U, 120U}) /* tables of records */
         put_ref(to, at + place, 224);
-    for (std::size_t place : {56, 64, 72, 80, 88}) /* inputs */
+    for (std::size_t place : {56U, 64U, 72U, 80U, 88U}) /* inputs */
         to.u32(at + place, NONE);
     for (std::size_t count = 168; count < 184; count += 2)
         to.u16(at + count, 0);

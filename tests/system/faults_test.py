@@ -25,6 +25,7 @@ import pytest
 
 from cases import ATTRIBUTE, BEFORE, BLOCK, HEAD, OUT, SOURCE, TIMEOUT
 from cases import as_nobody, attributes, check, expect, limit, only_zeros
+from traced import TRACE, ended, traced
 
 
 
@@ -404,6 +405,15 @@ def test_file_size_limit(world):
         only_zeros(world)
     expect(world.run(preexec_fn=limit(resource.RLIMIT_FSIZE, gross)), 0)
     check(world.read() == good, "another database")
+
+
+def test_output_is_filled_with_whole_blocks(world):
+    """The file is filled to the least multiple of a block that holds the database, not a byte further."""
+    good = world.good(HEAD + attributes(50))
+    status, *_ = ended(traced(world, "write,writev", []))
+    check(status == 0, "the program cannot be traced")
+    written = sum(int(count) for count in re.findall(rb"^(?:\d+ )?writev?\(.* = (\d+)$", world.read(TRACE), re.M))
+    check(written == -(-len(good) // BLOCK) * BLOCK, "filled with", written, "bytes for", len(good))
 
 
 def test_file_system_full(world):

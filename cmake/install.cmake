@@ -65,6 +65,11 @@ file(MAKE_DIRECTORY "${CMAKE_CURRENT_BINARY_DIR}/doc")
 file(CREATE_LINK "${headers_of_docs}" "${CMAKE_CURRENT_BINARY_DIR}/doc/include" SYMBOLIC)
 install(FILES "${CMAKE_CURRENT_BINARY_DIR}/doc/include" DESTINATION "${CMAKE_INSTALL_DOCDIR}" COMPONENT documents)
 
+# For programs that read what cdef writes as JSON.
+if(TARGET cdef)
+  install(DIRECTORY schema DESTINATION "${CMAKE_INSTALL_DATADIR}/cdgen" COMPONENT program)
+endif()
+
 # For editors. Vim looks below its own prefix for the files of all users; Visual Studio Code has no such place.
 set(CDGEN_VIM_DIR "${CMAKE_INSTALL_DATADIR}/vim/vimfiles" CACHE STRING "Where Vim looks for the files of all users")
 install(DIRECTORY editors/vim/ DESTINATION "${CDGEN_VIM_DIR}" COMPONENT program)

@@ -1,61 +1,98 @@
-/* json.cpp: findings as JSON. */
+/* json.cpp: findings as JSON. docs/check.md describes it, and share/cdef-check.schema.json is its schema. */
 
-#include "report/json_text.h"
+#include "report/places.h"
 #include "report/report.h"
-
-#include <nlohmann/json.hpp>
-
-#include <utility>
 
 namespace report {
 
 namespace {
 
-using json = nlohmann::ordered_json;
+using check::place;
 
-json number_or_null(size_t number) {
-    return number == 0 ? json() : json(number);
+void add_number_or_null(json_writer &to, std::string_view key, size_t number) {
+    if (number == 0)
+        to.add_null(key);
+    else
+        to.add_number(key, number);
 }
 
-void add_place(json &to, const check::place &at) {
-    to["line"] = number_or_null(static_cast<size_t>(at.line));
-    to["column"] = number_or_null(at.column);
-    to["length"] = at.column == 0 ? json() : json(at.length);
-}
-
-json json_of(const check::finding &found) {
-    json data;
-    data["code"] = found.code;
-    data["severity"] = found.error ? "error" : "warning";
-    data["name"] = found.name;
-    data["message"] = found.text;
-    add_place(data, found.at);
-    data["source"] = found.source;
-    data["notes"] = json::array();
-    for (const check::note &more : found.notes) {
-        json entry;
-        entry["message"] = more.text;
-        add_place(entry, more.at);
-        data["notes"].push_back(std::move(entry));
+/* source: the place's line, or empty if it is not known; characters are counted in it. */
+void add_place(json_writer &to, const place &at, std::string_view source) {
+    constexpr const char *keys[] = {"column", "length", "character_column", "character_length"};
+    add_number_or_null(to, "line", static_cast<size_t>(at.line));
+    if (at.column == 0) {
+        for (const char *key : keys)
+            to.add_null(key);
+        return;
     }
-    return data;
+    character_range in_characters = characters_of(at, source);
+    const size_t numbers[] = {at.column, at.length, in_characters.column, in_characters.length};
+    for (size_t i = 0; i < std::size(keys); ++i)
+        to.add_number(keys[i], numbers[i]);
 }
+
+class json_writer_of_findings : public writer {
+public:
+    explicit json_writer_of_findings(output written_to) : to(std::move(written_to)) {
+        to.open_object();
+        to.add_schema("cdef-check.schema.json", 1);
+        to.open_list("sources");
+    }
+    void begin_source(const std::string &file) override {
+        to.open_object();
+        to.add_text("file", file);
+        to.open_list("findings");
+    }
+    void add(const check::finding &found) override {
+        to.open_object();
+        to.add_text("code", found.code);
+        to.add_text("severity", found.error ? "error" : "warning");
+        to.add_text("name", found.name);
+        to.add_text("message", found.text);
+        add_place(to, found.at, found.source);
+        to.add_text("source", found.source);
+        to.open_list("notes");
+        for (const check::note &more : found.notes) {
+            to.open_object();
+            to.add_text("message", more.text);
+            add_place(to, more.at, source_of(more, found));
+            to.close();
+        }
+        to.close();
+        to.close();
+    }
+    void end_source(const check::totals &count) override {
+        to.close();
+        add_counts(count);
+        to.close();
+        all.errors += count.errors;
+        all.warnings += count.warnings;
+    }
+    void fail_source(const std::string &why) override {
+        to.close();
+        to.add_text("unreadable", why);
+        to.close();
+    }
+    void close() override {
+        to.close();
+        add_counts(all);
+        to.close();
+    }
+
+private:
+    void add_counts(const check::totals &count) {
+        to.add_number("errors", count.errors);
+        to.add_number("warnings", count.warnings);
+    }
+
+    json_writer to;
+    check::totals all;
+};
 
 } // namespace
 
-std::string as_json(std::span<const checked_source> checked) {
-    json all = json::array();
-    for (const checked_source &each : checked) {
-        json entry;
-        entry["file"] = each.file;
-        entry["errors"] = each.count.errors;
-        entry["warnings"] = each.count.warnings;
-        entry["findings"] = json::array();
-        for (const check::finding &found : each.findings)
-            entry["findings"].push_back(json_of(found));
-        all.push_back(std::move(entry));
-    }
-    return json_text(all);
+std::unique_ptr<writer> json_form(output to) {
+    return std::make_unique<json_writer_of_findings>(std::move(to));
 }
 
 } // namespace report

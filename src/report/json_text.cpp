@@ -12,13 +12,8 @@ constexpr bool ASCII_ONLY = true; /* whatever a terminal would act upon is escap
 
 } // namespace
 
-std::string json_text(const nlohmann::ordered_json &data) {
-    constexpr int INDENT = 2;
-    return data.dump(INDENT, ' ', ASCII_ONLY, nlohmann::ordered_json::error_handler_t::replace) + "\n";
-}
-
 std::string json_line(const nlohmann::ordered_json &data) {
-    return data.dump(-1, ' ', ASCII_ONLY);
+    return data.dump(-1, ' ', ASCII_ONLY, nlohmann::ordered_json::error_handler_t::replace);
 }
 
 } // namespace report

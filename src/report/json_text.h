@@ -8,11 +8,7 @@
 
 namespace report {
 
-/* Indented, ASCII only, with a newline after it. Bytes that are not UTF-8 (a file's name may have some) become U+FFFD.
- */
-std::string json_text(const nlohmann::ordered_json &data);
-
-/* The same on one line, without the newline. All texts are UTF-8. */
+/* On one line, ASCII only, without a newline. Bytes that are not UTF-8 (a file's name may have some) become U+FFFD. */
 std::string json_line(const nlohmann::ordered_json &data);
 
 } // namespace report

@@ -63,7 +63,23 @@ std::string uri_of(std::string_view file) {
 }
 
 size_t characters_in(std::string_view source, size_t bytes) {
-    return text::characters_in(source.substr(0, bytes));
+    size_t characters = 0;
+    for (size_t at = 0; at < std::min(bytes, source.size()); at += text::length_replaced(source.substr(at)))
+        ++characters;
+    return characters;
+}
+
+character_range characters_of(const place &at, std::string_view source) {
+    if (source.empty())
+        return {at.column, at.length};
+    size_t before = characters_in(source, at.column - 1);
+    return {before + 1, characters_in(source, at.column - 1 + at.length) - before};
+}
+
+std::string_view source_of(const check::note &more, const check::finding &found) {
+    if (!more.source.empty())
+        return more.source;
+    return more.at.line == found.at.line ? std::string_view(found.source) : std::string_view();
 }
 
 } // namespace report

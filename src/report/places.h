@@ -20,8 +20,20 @@ std::string excerpt_of(const check::place &at, std::string_view source);
 /* A relative or absolute path as a URI reference: bytes that must not stand in one are written as %XX. */
 std::string uri_of(std::string_view file);
 
-/* UTF-8 characters that begin in the first bytes of a text. */
+/* UTF-8 characters that begin in the first bytes of a text. What begins one and is cut short counts as one. */
 std::size_t characters_in(std::string_view source, std::size_t bytes);
+
+/* The characters of a place that has a column. */
+struct character_range {
+    std::size_t column; /* from 1 */
+    std::size_t length;
+};
+
+/* source: the place's line; if it is empty, bytes count instead of characters. */
+character_range characters_of(const check::place &at, std::string_view source);
+
+/* The line that a note is about; empty if it is not known. */
+std::string_view source_of(const check::note &more, const check::finding &found);
 
 } // namespace report
 

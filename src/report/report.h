@@ -1,31 +1,44 @@
-/* report.h: findings in sources, as text, JSON and SARIF. */
+/* report.h: findings in sources, in the forms that people and other programs read. */
 #ifndef CDGEN_REPORT_REPORT_H
 #define CDGEN_REPORT_REPORT_H
 
 #include "check/check.h"
+#include "report/json_writer.h"
 
-#include <span>
+#include <cstddef>
+#include <memory>
 #include <string>
-#include <vector>
 
 namespace report {
 
-/* What was found in one source. */
-struct checked_source {
-    std::string file;
-    std::vector<check::finding> findings;
-    check::totals count;
+/* Writes findings as it is given them, and keeps none of them longer than their form demands. */
+class writer {
+public:
+    writer() = default;
+    writer(const writer &) = delete;
+    writer &operator=(const writer &) = delete;
+    virtual ~writer() = default;
+
+    /* A source; what is added up to its end was found in it. */
+    virtual void begin_source(const std::string &file) = 0;
+    virtual void add(const check::finding &found) = 0;
+    virtual void end_source(const check::totals &count) = 0;
+    /* The same if the source could not be read, or not to its end. why: a message that names the source. */
+    virtual void fail_source(const std::string &why) = 0;
+    /* There are no more sources. */
+    virtual void close() = 0;
 };
+
+/* Each writes a document for all sources. */
+std::unique_ptr<writer> json_form(output to);
+std::unique_ptr<writer> sarif_form(output to);
 
 /* As compilers write it: a line for the finding and each note, and the line of the source with a mark. Nothing of a
  * source, or of its name, can steer a terminal. */
+std::unique_ptr<writer> text_form(output to);
+
+/* One finding in that form. */
 std::string as_text(const std::string &file, const check::finding &found);
-
-/* A document for all sources. */
-std::string as_json(std::span<const checked_source> checked);
-
-/* The same as SARIF 2.1.0. */
-std::string as_sarif(std::span<const checked_source> checked);
 
 } // namespace report
 

@@ -18,16 +18,14 @@ using check::note;
 using check::place;
 using json = nlohmann::ordered_json;
 
-/* Columns are characters; without the line, bytes have to do. */
 json region_of(const place &at, std::string_view source) {
     json region;
     region["startLine"] = at.line;
     if (at.column == 0)
         return region;
-    size_t before = at.column - 1;
-    size_t end = before + at.length;
-    region["startColumn"] = (source.empty() ? before : characters_in(source, before)) + 1;
-    region["endColumn"] = (source.empty() ? end : characters_in(source, end)) + 1;
+    character_range in_characters = characters_of(at, source);
+    region["startColumn"] = in_characters.column;
+    region["endColumn"] = in_characters.column + in_characters.length;
     return region;
 }
 
@@ -38,13 +36,6 @@ json location_of(const std::string &file, const place &at, std::string_view sour
     if (at.line != 0)
         physical["region"] = region_of(at, source);
     return location;
-}
-
-/* The line that a note is about; empty if it is not known. */
-std::string_view source_of(const note &more, const finding &found) {
-    if (!more.source.empty())
-        return more.source;
-    return more.at.line == found.at.line ? std::string_view(found.source) : std::string_view();
 }
 
 json result_of(const std::string &file, const finding &found) {
@@ -79,25 +70,46 @@ json rules() {
     return all;
 }
 
+class sarif_writer : public writer {
+public:
+    explicit sarif_writer(output written_to) : to(std::move(written_to)) {
+        to.open_object();
+        to.add_text("$schema", "https://json.schemastore.org/sarif-2.1.0.json");
+        to.add_text("version", "2.1.0");
+        to.open_list("runs");
+        to.open_object();
+        json driver;
+        driver["name"] = "cdef check";
+        driver["version"] = CDGEN_VERSION;
+        driver["rules"] = rules();
+        to.open_object("tool");
+        to.add_json("driver", json_line(driver));
+        to.close();
+        to.add_text("columnKind", "unicodeCodePoints");
+        to.open_list("results");
+    }
+    void begin_source(const std::string &name) override {
+        file = name;
+    }
+    void add(const finding &found) override {
+        to.add_json({}, json_line(result_of(file, found)));
+    }
+    void end_source(const check::totals & /* count */) override {}
+    void fail_source(const std::string & /* why */) override {}
+    void close() override {
+        for (int levels = 4; levels > 0; --levels)
+            to.close();
+    }
+
+private:
+    json_writer to;
+    std::string file;
+};
+
 } // namespace
 
-std::string as_sarif(std::span<const checked_source> checked) {
-    json driver;
-    driver["name"] = "cdef check";
-    driver["version"] = CDGEN_VERSION;
-    driver["rules"] = rules();
-    json run;
-    run["tool"]["driver"] = std::move(driver);
-    run["columnKind"] = "unicodeCodePoints";
-    run["results"] = json::array();
-    for (const checked_source &each : checked)
-        for (const finding &found : each.findings)
-            run["results"].push_back(result_of(each.file, found));
-    json log;
-    log["$schema"] = "https://json.schemastore.org/sarif-2.1.0.json";
-    log["version"] = "2.1.0";
-    log["runs"].push_back(std::move(run));
-    return json_text(log);
+std::unique_ptr<writer> sarif_form(output to) {
+    return std::make_unique<sarif_writer>(std::move(to));
 }
 
 } // namespace report

@@ -3,6 +3,7 @@
 #include "text/utf8.h"
 
 #include <algorithm>
+#include <string>
 
 namespace text {
 
@@ -26,6 +27,19 @@ std::size_t utf8_length(std::string_view bytes) {
 
 std::size_t length_or_1(std::string_view bytes) {
     return bytes.empty() ? 0 : std::max<std::size_t>(utf8_length(bytes), 1);
+}
+
+std::size_t length_replaced(std::string_view bytes) {
+    if (std::size_t length = utf8_length(bytes); length != 0 || bytes.empty())
+        return length;
+    for (std::size_t whole = 4; whole > 2; --whole)
+        for (std::size_t length = std::min(whole - 1, bytes.size()); length > 1; --length) {
+            std::string completed(bytes.substr(0, length));
+            completed.append(whole - length, '\x80');
+            if (utf8_length(completed) == whole)
+                return length;
+        }
+    return 1;
 }
 
 bool is_utf8(std::string_view bytes) {

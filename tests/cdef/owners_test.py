@@ -270,7 +270,7 @@ def test_all_subcommands_name_the_owner(name, options, directory):
     same({name: values for name, _, values in records if values}, case.values, "dump")
     shown = [(json.dumps(low), json.dumps(high)) for values in case.values.values() for low, high in values]
     same(values_in(programs.cdef("dump", "--hex", "made.cdef")), shown, "dump --hex")
-    findings = json.loads(programs.cdef("verify", "--json", "made.cdef"))[0]["findings"]
+    findings = json.loads(programs.cdef("verify", "--json", "made.cdef"))["files"][0]["findings"]
     places = [finding["offset"] for finding in findings if finding["code"] == NOT_ITS_OWN]
     same({max((at, name) for name, at, _ in records if at <= place)[1] for place in places}, case.warned, "verify")
     lines = {name: [f"{low},{high}" for low, high in values] for name, values in case.values.items()}

@@ -227,7 +227,7 @@ void look_at_verify(const outcome &came, const bytes &image, const words &form) 
     bool passes = has("--werror") ? !is.found : is.sound;
     fuzz::require(came.status == (passes ? cdef::OK : cdef::FOUND) && came.err.empty(), "another verdict");
     if (has("--json"))
-        fuzz::require(parsed(came.out).at(0).at("sound") == passes, "another verdict in JSON");
+        fuzz::require(parsed(came.out).at("files").at(0).at("sound") == passes, "another verdict in JSON");
     else
         fuzz::require(came.out.empty() != (has("--quiet") ? !is.sound : is.found), "findings are not told, or none");
 }
@@ -293,7 +293,7 @@ void look_at_diff(const outcome &came, const bytes &before, const bytes &after, 
         return;
     }
     bool as_json = std::find(form.begin(), form.end(), "--json") != form.end();
-    bool none = as_json ? parsed(came.out).empty() : came.out.empty();
+    bool none = as_json ? parsed(came.out).at("differences").empty() : came.out.empty();
     fuzz::require(none == (came.status == cdef::OK), "differences are not told, or none");
 }
 
@@ -340,7 +340,7 @@ void look_at_check(const outcome &came, const bytes &source, const words &form) 
     else
         fuzz::require(came.status == (compiles ? cdef::OK : cdef::FOUND), "check and compiler differ");
     if (has("json"))
-        expect_first(parsed(came.out).at(0).at("findings"), compiler.err);
+        expect_first(parsed(came.out).at("sources").at(0).at("findings"), compiler.err);
     else if (has("sarif"))
         fuzz::require(parsed(came.out).at("version") == "2.1.0", "no SARIF");
     else

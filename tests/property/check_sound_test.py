@@ -150,7 +150,7 @@ def differences(paths, directory):
         return [f"status {result.returncode}: {result.stderr!r} for {paths}"]
     problems = []
     said = compiled(PROGRAMS.compile_many, paths, directory)
-    for path, checked, expected in zip(paths, json.loads(result.stdout), said):
+    for path, checked, expected in zip(paths, json.loads(result.stdout)["sources"], said):
         errors = [each for each in checked["findings"] if each["severity"] == "error"]
         if not same(expected, errors):
             problems.append(f"{path}: cdgen says {expected!r}, cdef check {errors[:1]}")

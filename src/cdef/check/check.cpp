@@ -4,17 +4,17 @@
 
 #include "cdef/cdef.h"
 #include "cdef/support/failure.h"
+#include "cdef/support/forms.h"
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
 #include "report/report.h"
 
 #include <CLI/CLI.hpp>
 
-#include <cstddef>
 #include <cstdio>
 #include <memory>
 #include <string>
-#include <utility>
+#include <string_view>
 #include <vector>
 
 namespace cdef {
@@ -25,7 +25,7 @@ using check::warning;
 
 struct check_options {
     std::vector<std::string> sources;
-    std::string format = "text";
+    std::string form;
     std::vector<std::string> wanted;
     std::vector<std::string> unwanted;
     bool warnings_count = false; /* as errors do */
@@ -57,59 +57,45 @@ check::warning_set chosen(const check_options &options) {
     return set;
 }
 
-void show_text(const std::string &text) {
+void show_text(std::string_view text) {
     if (std::fwrite(text.data(), 1, text.size(), stderr) != text.size())
         throw failure("standard error: cannot write");
 }
 
-/* Checks a source and shows what is found in it. */
-check::totals check_as_text(const std::string &source, const check::warning_set &wanted) {
-    constexpr std::size_t PORTION = 65536; /* bytes that are written at once */
-    std::string text;
-    check::totals count = check::check_file(source, wanted, [&](const check::finding &found) {
-        text += report::as_text(source, found);
-        if (text.size() >= PORTION)
-            show_text(std::exchange(text, {}));
-    });
-    show_text(text);
-    return count;
+std::unique_ptr<report::writer> form_of(const check_options &options) {
+    if (options.form == "json")
+        return report::json_form(print);
+    if (options.form == "sarif")
+        return report::sarif_form(print);
+    return report::text_form(show_text);
 }
 
-report::checked_source check_for_later(const std::string &source, const check::warning_set &wanted) {
-    report::checked_source checked = {.file = source, .findings = {}, .count = {}};
-    checked.count = check::check_file(source, wanted,
-                                      [&](check::finding &&found) { checked.findings.push_back(std::move(found)); });
-    return checked;
+check::totals check_source(const std::string &source, const check::warning_set &wanted, report::writer &to) {
+    if (is_database(source))
+        throw check::cannot_check(source + ": a database, not a source; 'cdef verify' checks databases");
+    return check::check_file(source, wanted, [&to](const check::finding &found) { to.add(found); });
 }
 
-void show(const std::vector<report::checked_source> &checked, const std::string &format) {
-    if (format == "json")
-        print(report::as_json(checked));
-    if (format == "sarif")
-        print(report::as_sarif(checked));
-}
-
-/* Checks all sources. One that cannot be read is reported at once, and so are findings in text form. */
+/* Checks all sources. */
 int check_all(const check_options &options) {
-    std::vector<report::checked_source> all;
+    std::unique_ptr<report::writer> form = form_of(options);
+    check::warning_set wanted = chosen(options);
     bool pass = true;
     bool read = true;
     for (const std::string &source : options.sources) {
+        form->begin_source(source);
         try {
-            if (is_database(source))
-                throw check::cannot_check(source + ": a database, not a source; 'cdef verify' checks databases");
-            check::totals count;
-            if (options.format == "text")
-                count = check_as_text(source, chosen(options));
-            else
-                count = all.emplace_back(check_for_later(source, chosen(options))).count;
+            check::totals count = check_source(source, wanted, *form);
+            form->end_source(count);
             pass = pass && count.errors == 0 && (count.warnings == 0 || !options.warnings_count);
         } catch (const check::cannot_check &unreadable) {
-            print_error(unreadable.what());
+            if (options.form != "text") /* which shows it itself */
+                print_error(unreadable.what());
+            form->fail_source(unreadable.what());
             read = false;
         }
     }
-    show(all, options.format);
+    form->close();
     return !read ? FAILED : pass ? OK : FOUND;
 }
 
@@ -119,8 +105,8 @@ void add_check(CLI::App &app, int &status) {
     auto options = std::make_shared<check_options>();
     CLI::App *command = app.add_subcommand("check", "Checks sources and reports every mistake, not just the first");
     command->add_option("SOURCE", options->sources, "Source to check; - is standard input")->required();
-    command->add_option("--format", options->format, "Form of the findings: text (on standard error), json or sarif")
-        ->check(CLI::IsMember({"text", "json", "sarif"}));
+    add_forms(*command, options->form, {"text", "json", "sarif"},
+              "Form of the findings: text (on standard error), json or sarif");
     command->add_option("--warn", options->wanted, "Turn on warning NAME, or all")
         ->type_name("NAME")
         ->allow_extra_args(false)

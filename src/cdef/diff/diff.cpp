@@ -2,16 +2,18 @@
 
 #include "cdef/cdef.h"
 #include "cdef/support/failure.h"
+#include "cdef/support/forms.h"
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
 #include "compare/compare.h"
 #include "compare/text.h"
-#include "report/json_text.h"
+#include "report/json_writer.h"
 
 #include <CLI/CLI.hpp>
-#include <nlohmann/json.hpp>
 
+#include <algorithm>
 #include <memory>
+#include <span>
 
 namespace cdef {
 
@@ -21,13 +23,12 @@ using compare::change;
 using compare::difference;
 using compare::node;
 using compare::node_kind;
-using json = nlohmann::ordered_json;
 
 struct diff_options {
     std::string before;
     std::string after;
     bool compat = false; /* only what breaks readers */
-    bool as_json = false;
+    std::string form;
 };
 
 const char *name_of(change what) {
@@ -65,24 +66,48 @@ std::string line_of(const difference &d, bool one_class, bool with_reason) {
     return line + "\n";
 }
 
-json json_of(const difference &d) {
-    json data;
-    data["change"] = name_of(d.what);
-    data["path"] = json::array();
+/* Adds a difference to a list. */
+void add_difference(report::json_writer &to, const difference &d) {
+    to.open_object();
+    to.add_text("change", name_of(d.what));
+    to.open_list("path");
     for (const node *n : std::span(d.path).subspan(1)) { /* the first is the database */
-        json entry;
-        entry["kind"] = n->label();
-        entry["name"] = n->name;
-        data["path"].push_back(std::move(entry));
+        to.open_object();
+        to.add_text("kind", n->label());
+        to.add_text("name", n->name);
+        to.close();
     }
+    to.close();
     if (d.what == change::changed) {
-        data["field"] = d.before->what->field;
-        data["before"] = d.before->text;
-        data["after"] = d.after->text;
+        to.add_text("field", d.before->what->field);
+        to.add_text("before", d.before->text);
+        to.add_text("after", d.after->text);
     }
     if (!breach(d).empty())
-        data["breaks"] = breach(d);
-    return data;
+        to.add_text("breaks", breach(d));
+    to.close();
+}
+
+void show_json(const diff_options &options, const std::vector<difference> &found) {
+    report::json_writer to(print);
+    to.open_object();
+    to.add_schema("cdef-diff.schema.json", 1);
+    to.add_text("before", options.before);
+    to.add_text("after", options.after);
+    to.open_list("differences");
+    for (const difference &d : found)
+        add_difference(to, d);
+    to.close();
+    to.close();
+}
+
+void show_text(const std::vector<difference> &found, bool one_class, bool with_reason) {
+    output out;
+    for (const difference &d : found) {
+        out.text += line_of(d, one_class, with_reason);
+        out.flush_if_full();
+    }
+    out.flush();
 }
 
 node read(const std::string &path, std::unique_ptr<input> &in) {
@@ -104,15 +129,10 @@ int diff(const diff_options &options) {
     std::vector<difference> found = compare::differences(before, after);
     if (options.compat)
         std::erase_if(found, [](const difference &d) { return breach(d).empty(); });
-    bool one_class = has_one_class(before) && has_one_class(after);
-    std::string text;
-    json all = json::array();
-    for (const difference &d : found)
-        if (options.as_json)
-            all.push_back(json_of(d));
-        else
-            text += line_of(d, one_class, options.compat);
-    print(options.as_json ? report::json_text(all) : text);
+    if (options.form == "json")
+        show_json(options, found);
+    else
+        show_text(found, has_one_class(before) && has_one_class(after), options.compat);
     return found.empty() ? OK : FOUND;
 }
 
@@ -125,7 +145,7 @@ void add_diff(CLI::App &app, int &status) {
     command->add_option("B", options->after, "Second database; - is standard input")->required();
     command->add_flag("--compat", options->compat,
                       "Show only what keeps programs written for A from reading B, and why");
-    command->add_flag("--json", options->as_json, "Write differences as JSON");
+    add_forms(*command, options->form, {"text", "json"}, "Form of the differences: text or json");
     command->footer("Exit status: 0 if they are the same (with --compat: if programs written for A can read B), 1 if "
                     "not, 2 if a database cannot be read.");
     command->callback([options, &status] { status = diff(*options); });

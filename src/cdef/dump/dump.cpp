@@ -3,6 +3,7 @@
 #include "cdef/dump/dump.h"
 #include "cdef/cdef.h"
 #include "cdef/support/failure.h"
+#include "cdef/support/forms.h"
 
 #include <CLI/CLI.hpp>
 
@@ -14,17 +15,18 @@ namespace {
 
 struct dump_options {
     std::string file;
-    bool as_json = false;
-    bool as_hex = false;
+    std::string form;
     bool with_offsets = false;
 };
 
 void run(const dump_options &options) {
+    if (options.form == "hex" && options.with_offsets)
+        throw failure("--offsets is not for the form hex, which shows all offsets");
     input in(options.file);
-    if (options.as_hex)
+    if (options.form == "hex")
         return dump::show_hex(in);
     readability found = require_readable(in);
-    if (options.as_json)
+    if (options.form == "json")
         dump::show_json(in, found, options.with_offsets);
     else
         dump::show_listing(in, found, options.with_offsets);
@@ -36,11 +38,9 @@ void add_dump(CLI::App &app, int &status) {
     auto options = std::make_shared<dump_options>();
     CLI::App *command = app.add_subcommand("dump", "Shows what is in a database");
     command->add_option("FILE", options->file, "Database to show; - is standard input")->required();
-    auto *json = command->add_flag("--json", options->as_json, "Write JSON");
-    auto *hex = command->add_flag("--hex", options->as_hex, "Show every byte and what it is, even of a damaged file");
-    command->add_flag("--offsets", options->with_offsets, "Also show the offset of each record and list")
-        ->excludes(hex);
-    json->excludes(hex);
+    add_forms(*command, options->form, {"text", "json", "hex"},
+              "Form of what is shown: text, json, or hex: every byte and what it is, even of a damaged file");
+    command->add_flag("--offsets", options->with_offsets, "Also show the offset of each record and list");
     command->footer("Exit status: 0 if the database is shown, 2 if it cannot be shown.");
     command->callback([options, &status] {
         run(*options);

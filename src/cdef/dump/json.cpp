@@ -3,6 +3,7 @@
 #include "cdef/dump/dump.h"
 #include "cdef/support/output.h"
 #include "report/json_text.h"
+#include "report/json_writer.h"
 #include "text/hex.h"
 #include "text/number.h"
 #include "text/utf8.h"
@@ -11,6 +12,7 @@
 
 #include <charconv>
 #include <cmath>
+#include <utility>
 
 namespace cdef::dump {
 
@@ -80,8 +82,8 @@ json json_of(const checksum &c) {
     data["correct"] = c.found.empty();
     if (c.found.empty())
         return data;
-    data["found"] = c.found;
-    data["expected"] = c.expected;
+    data["found"] = std::strtoul(c.found.c_str(), nullptr, 16);
+    data["expected"] = std::strtoul(c.expected.c_str(), nullptr, 16);
     return data;
 }
 
@@ -89,56 +91,24 @@ json json_of(const checksum &c) {
 class json_form : public sink {
 public:
     void open(const label &group) override {
-        begin(group, '{', '}');
+        bool is_document = std::exchange(first, false);
+        to.open_object(group.key);
+        if (is_document)
+            to.add_schema("cdef-dump.schema.json", 1);
     }
     void open_list(const label &list) override {
-        begin(list, '[', ']');
+        to.open_list(list.key);
     }
     void close() override {
-        level closed = levels.back();
-        levels.pop_back();
-        if (!closed.is_empty)
-            new_line();
-        out.text += closed.end;
-        if (levels.empty())
-            out.text += '\n';
-        out.flush_if_full();
+        to.close();
     }
     void add(const label &what, const fact &f) override {
-        next(what);
-        out.text += report::json_line(std::visit([](const auto &some) { return json_of(some); }, f));
+        to.add_json(what.key, report::json_line(std::visit([](const auto &some) { return json_of(some); }, f)));
     }
-
-    output out;
 
 private:
-    struct level {
-        char end;
-        bool is_empty = true;
-    };
-
-    void begin(const label &group, char start, char end) {
-        next(group);
-        out.text += start;
-        levels.push_back({end});
-    }
-    /* Where the next member of the innermost group goes. */
-    void next(const label &what) {
-        if (levels.empty())
-            return;
-        if (!levels.back().is_empty)
-            out.text += ',';
-        levels.back().is_empty = false;
-        new_line();
-        if (levels.back().end == '}')
-            out.text += report::json_line(what.key) + ": ";
-    }
-    void new_line() {
-        out.text += '\n';
-        out.text.append(levels.size() * 2, ' ');
-    }
-
-    std::vector<level> levels;
+    report::json_writer to{print};
+    bool first = true;
 };
 
 } // namespace
@@ -146,7 +116,6 @@ private:
 void show_json(const input &in, const readability &found, bool with_offsets) {
     json_form to;
     walk(in.db, found, to, with_offsets);
-    to.out.flush();
 }
 
 } // namespace cdef::dump

@@ -12,7 +12,7 @@
 
 namespace cdef {
 
-void print(const std::string &text) {
+void print(std::string_view text) {
     if (std::fwrite(text.data(), 1, text.size(), stdout) != text.size() || std::fflush(stdout) != 0)
         throw failure(std::string("standard output: ") + std::strerror(errno));
 }

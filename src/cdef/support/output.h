@@ -4,11 +4,12 @@
 
 #include <cstddef>
 #include <string>
+#include <string_view>
 
 namespace cdef {
 
 /* Writes to standard output; throws failure if that fails. */
-void print(const std::string &text);
+void print(std::string_view text);
 
 /* True if terminal colours are wanted: standard output is a terminal, and NO_COLOR is not set or empty. */
 bool wants_colour();

@@ -5,7 +5,9 @@
 #include "text/append.h"
 #include "text/shown.h"
 
-#include <nlohmann/json.hpp>
+#include <charconv>
+#include <cstdint>
+#include <string_view>
 
 namespace cdef::verify {
 
@@ -32,19 +34,34 @@ std::string line_of(const std::string &file, const cdb::finding &f) {
     return line;
 }
 
-nlohmann::ordered_json json_of(const cdb::finding &f) {
-    nlohmann::ordered_json data;
-    data["code"] = f.broken->code;
-    data["severity"] = name_of(f.broken->level);
-    data["title"] = f.broken->title;
-    data["section"] = f.section ? nlohmann::ordered_json(*f.section) : nlohmann::ordered_json();
-    data["record"] = f.record;
-    data["index"] = f.index;
-    data["field"] = f.field;
-    data["offset"] = f.offset;
-    data["found"] = f.found;
-    data["expected"] = f.expected;
-    return data;
+std::string json_value(const std::string &shown) {
+    bool hexadecimal = shown.starts_with("0x");
+    std::string_view digits = std::string_view(shown).substr(hexadecimal ? 2 : 0);
+    std::uint64_t number = 0;
+    auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), number, hexadecimal ? 16 : 10);
+    if (error == std::errc() && end == digits.data() + digits.size())
+        return std::to_string(number);
+    std::string value;
+    report::append_json(value, shown);
+    return value;
+}
+
+void add_finding(report::json_writer &to, const cdb::finding &f) {
+    to.open_object();
+    to.add_text("code", f.broken->code);
+    to.add_text("severity", name_of(f.broken->level));
+    to.add_text("title", f.broken->title);
+    if (f.section)
+        to.add_number("section", *f.section);
+    else
+        to.add_null("section");
+    to.add_text("record", f.record);
+    to.add_number("index", f.index);
+    to.add_text("field", f.field);
+    to.add_number("offset", f.offset);
+    to.add_json("found", json_value(f.found));
+    to.add_json("expected", json_value(f.expected));
+    to.close();
 }
 
 } // namespace cdef::verify

@@ -3,8 +3,7 @@
 #define CDGEN_CDEF_VERIFY_FINDINGS_H
 
 #include "cdb_view.h"
-
-#include <nlohmann/json_fwd.hpp>
+#include "report/json_writer.h"
 
 #include <string>
 
@@ -16,7 +15,11 @@ std::string place_of(const cdb::finding &f);
 /* One line, as compilers write them, with a newline. file: its name, with any bytes. */
 std::string line_of(const std::string &file, const cdb::finding &f);
 
-nlohmann::ordered_json json_of(const cdb::finding &f);
+/* What was found, or expected, as JSON: a number, whether it is shown in decimal or in hexadecimal, or a text. */
+std::string json_value(const std::string &shown);
+
+/* Adds a finding to a list. */
+void add_finding(report::json_writer &to, const cdb::finding &f);
 
 } // namespace cdef::verify
 

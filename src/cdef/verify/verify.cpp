@@ -2,75 +2,124 @@
 
 #include "cdef/cdef.h"
 #include "cdef/support/failure.h"
+#include "cdef/support/forms.h"
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
 #include "cdef/verify/findings.h"
-#include "report/json_text.h"
+#include "report/json_writer.h"
 
 #include <CLI/CLI.hpp>
-#include <nlohmann/json.hpp>
 
+#include <algorithm>
 #include <memory>
 
 namespace cdef {
 
 namespace {
 
-using json = nlohmann::ordered_json;
-
 struct verify_options {
     std::vector<std::string> files;
-    bool as_json = false;
+    std::string form;
     bool warnings_count = false; /* a database with warnings fails as one with errors does */
     bool quiet = false;          /* warnings are not shown */
 };
 
-/* The findings in one file, in one of two forms, and whether it passes. */
-struct verdict {
-    std::string text;
-    json data;
-    bool passes = true;
+/* Shows what is found in each database. */
+class verify_form {
+public:
+    verify_form() = default;
+    verify_form(const verify_form &) = delete;
+    verify_form &operator=(const verify_form &) = delete;
+    virtual ~verify_form() = default;
+
+    virtual void add_file(const std::string &name, const std::vector<cdb::finding> &findings, bool sound) = 0;
+    virtual void add_unreadable(const std::string &name, const std::string &why) = 0;
+    virtual void close() = 0;
 };
 
-verdict judge(const std::string &path, const verify_options &options) {
+class text_form : public verify_form {
+public:
+    void add_file(const std::string &name, const std::vector<cdb::finding> &findings, bool /* sound */) override {
+        for (const cdb::finding &f : findings) {
+            out.text += verify::line_of(name, f);
+            out.flush_if_full();
+        }
+    }
+    void add_unreadable(const std::string & /* name */, const std::string & /* why */) override {}
+    void close() override {
+        out.flush();
+    }
+
+private:
+    output out;
+};
+
+class json_form : public verify_form {
+public:
+    json_form() : to(print) {
+        to.open_object();
+        to.add_schema("cdef-verify.schema.json", 1);
+        to.open_list("files");
+    }
+    void add_file(const std::string &name, const std::vector<cdb::finding> &findings, bool sound) override {
+        to.open_object();
+        to.add_text("file", name);
+        to.add_truth("sound", sound);
+        to.open_list("findings");
+        for (const cdb::finding &f : findings)
+            verify::add_finding(to, f);
+        to.close();
+        to.close();
+    }
+    void add_unreadable(const std::string &name, const std::string &why) override {
+        to.open_object();
+        to.add_text("file", name);
+        to.add_text("unreadable", why);
+        to.close();
+    }
+    void close() override {
+        to.close();
+        to.close();
+    }
+
+private:
+    report::json_writer to;
+};
+
+std::unique_ptr<verify_form> form_of(const std::string &name) {
+    if (name == "json")
+        return std::make_unique<json_form>();
+    return std::make_unique<text_form>();
+}
+
+/* Shows the findings in one file; whether it passes. */
+bool judge(const std::string &path, const verify_options &options, verify_form &form) {
     input in(path);
     if (is_text(in.contents))
         throw failure(path + ": a text, not a database; 'cdef check' checks sources");
-    verdict v = {.text = {}, .data = json::object()};
-    v.data["file"] = path;
-    v.data["sound"] = true;
-    v.data["findings"] = json::array();
-    for (const cdb::finding &f : cdb::verify(in.db)) {
-        bool counts = f.broken->level == cdb::severity::error || options.warnings_count;
-        v.passes = v.passes && !counts;
-        if (options.quiet && f.broken->level == cdb::severity::warning)
-            continue;
-        if (options.as_json)
-            v.data["findings"].push_back(verify::json_of(f));
-        else
-            v.text += verify::line_of(path, f);
-    }
-    v.data["sound"] = v.passes;
-    return v;
+    std::vector<cdb::finding> findings = cdb::verify(in.db);
+    auto is_warning = [](const cdb::finding &f) { return f.broken->level == cdb::severity::warning; };
+    bool sound = options.warnings_count ? findings.empty() : std::all_of(findings.begin(), findings.end(), is_warning);
+    if (options.quiet)
+        std::erase_if(findings, is_warning);
+    form.add_file(path, findings, sound);
+    return sound;
 }
 
 int run(const verify_options &options) {
-    json all = json::array();
-    std::string text;
+    std::unique_ptr<verify_form> form = form_of(options.form);
     bool pass = true;
     bool read = true;
     for (const std::string &file : options.files) {
         try {
-            verdict v = judge(file, options);
-            pass = pass && v.passes;
-            text += v.text;
-            all.push_back(std::move(v.data));
+            pass = judge(file, options, *form) && pass;
         } catch (const failure &unreadable) {
             print_error(unreadable.what());
+            form->add_unreadable(file, unreadable.what());
             read = false;
         }
     }
-    print(options.as_json ? report::json_text(all) : text);
+    form->close();
     return !read ? FAILED : pass ? OK : FOUND;
 }
 
@@ -81,7 +130,7 @@ void add_verify(CLI::App &app, int &status) {
     CLI::App *command =
         app.add_subcommand("verify", "Checks whether databases are sound; prints nothing about flawless ones");
     command->add_option("FILE", options->files, "Database to verify; - is standard input")->required();
-    command->add_flag("--json", options->as_json, "Write findings as JSON");
+    add_forms(*command, options->form, {"text", "json"}, "Form of the findings: text or json");
     command->add_flag("--werror", options->warnings_count, "Count warnings as errors");
     command->add_flag("-q,--quiet", options->quiet, "Show errors only");
     command->footer("Exit status: 0 without errors, 1 with errors (with --werror: or warnings), 2 if a file cannot be "

@@ -55,7 +55,7 @@ class Logs(unittest.TestCase):
 
     def test_all_cases(self):
         sources = sorted(path.name for path in CASES.glob("*.cdefsrc"))
-        found = [(each["file"], one) for each in check("json", *sources) for one in each["findings"]]
+        found = [(each["file"], one) for each in check("json", *sources)["sources"] for one in each["findings"]]
         results = self.sarif(*sources)
         self.assertGreater(len(results), len(sources))
         self.assertEqual(len(results), len(found))

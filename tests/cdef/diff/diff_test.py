@@ -327,6 +327,14 @@ def test_places_in_a_class_hash_are_not_compared(programs):
         same(programs.diff(one, two), (0, "", ""), order)
 
 
+def differences_in(text):
+    """Those of a document in JSON."""
+    data = json.loads(text)
+    same(list(data), ["schema", "version", "before", "after", "differences"], "members")
+    same((data["schema"], data["version"]), ("cdef-diff.schema.json", 1), "schema")
+    return data["differences"]
+
+
 def test_json_says_the_same(programs):
     """One object for each difference."""
     one = programs.compile(class_source(attribute("A", 1), attribute("B", 2), head="\tName=C\n"), "one.cdef")
@@ -346,9 +354,10 @@ def test_json_says_the_same(programs):
         "path": [*path, {"kind": "PersistentResourceAttribute", "name": "'B'"}],
         "breaks": "readers miss it",
     }
-    same((status, json.loads(text)), (1, [changed, removed]), "different")
+    same((status, differences_in(text)), (1, [changed, removed]), "different")
     status, text, _ = programs.diff("--json", one, one)
-    same((status, json.loads(text)), (0, []), "same")
+    same((status, differences_in(text)), (0, []), "same")
+    same(json.loads(text)["after"], str(one), "name of the file")
 
 
 def test_json_of_what_is_new_and_of_the_database(programs):
@@ -360,7 +369,7 @@ def test_json_of_what_is_new_and_of_the_database(programs):
     status, text, _ = programs.diff("--json", one, two)
     sequence = int.from_bytes([7, 0, 0, 0], sys.byteorder)
     changed = {"change": "changed", "path": [], "field": "cdb_hdr_seqno", "before": "0", "after": str(sequence)}
-    same((status, json.loads(text)), (1, [changed, {"change": "added", "path": path}]), "diff")
+    same((status, differences_in(text)), (1, [changed, {"change": "added", "path": path}]), "diff")
 
 
 def test_references_that_are_never_set_may_be_none(programs):

@@ -44,8 +44,8 @@ WRONG_FINDING = {
     "index": 0,
     "field": "rc_cb_ID",
     "offset": 144,
-    "found": "0x43444230",
-    "expected": "0x43444231",
+    "found": 0x43444230,
+    "expected": 0x43444231,
 }
 CARELESS_FINDING = {
     "code": "CDB353",
@@ -56,7 +56,7 @@ CARELESS_FINDING = {
     "index": 0,
     "field": "u_ra_valid_vals",
     "offset": 384,
-    "found": "0",
+    "found": 0,
     "expected": "in 0 bytes",
 }
 
@@ -111,7 +111,7 @@ class Output(unittest.TestCase):
     def test_help(self):
         status, text, messages = verify("--help")
         self.assertEqual((status, messages), (0, ""))
-        for option in ("--json", "--werror", "-q,--quiet", "FILE"):
+        for option in ("--format", "--json", "--werror", "-q,--quiet", "FILE"):
             self.assertIn(option, text)
 
 
@@ -121,8 +121,11 @@ class Json(unittest.TestCase):
     def parsed(self, expected_status, *operands):
         status, text, messages = verify("--json", *operands)
         self.assertEqual((status, messages), (expected_status, ""))
-        self.assertTrue(text.endswith("]\n"))
-        return json.loads(text)
+        self.assertTrue(text.endswith("}\n"))
+        data = json.loads(text)
+        self.assertEqual(list(data), ["schema", "version", "files"])
+        self.assertEqual((data["schema"], data["version"]), ("cdef-verify.schema.json", 1))
+        return data["files"]
 
     def test_sound(self):
         self.assertEqual(self.parsed(0, SOUND), [{"file": SOUND, "sound": True, "findings": []}])
@@ -161,7 +164,7 @@ class Json(unittest.TestCase):
             pathlib.Path(os.fsdecode(path)).write_bytes((PROGRAMS.images / SOUND).read_bytes())
             status, text, messages = verify("--json", path)
             self.assertEqual((status, messages), (0, ""))
-            self.assertIs(json.loads(text)[0]["sound"], True)
+            self.assertIs(json.loads(text)["files"][0]["sound"], True)
 
 
 class Input(unittest.TestCase):
@@ -199,7 +202,10 @@ class Input(unittest.TestCase):
         self.assertEqual(verify(WRONG, "none.cdef", CARELESS), (2, lines, missing))
         status, text, messages = verify("--json", "none.cdef", WRONG, "broken")
         self.assertEqual((status, messages), (2, missing + "cdef: broken: Is a directory\n"))
-        self.assertEqual([each["file"] for each in json.loads(text)], [WRONG])
+        unread, wrong, directory = json.loads(text)["files"]
+        self.assertEqual(unread, {"file": "none.cdef", "unreadable": missing[len("cdef: "):-1]})
+        self.assertEqual((wrong["file"], wrong["sound"]), (WRONG, False))
+        self.assertEqual(directory, {"file": "broken", "unreadable": "broken: Is a directory"})
 
     def test_a_source_belongs_to_check(self):
         for text, shown in (("ControlDefinition\n\tFileVersion=1\n", True), ("x", True), ("", False), ("x\0", False)):
@@ -414,7 +420,7 @@ class Compiled(unittest.TestCase):
     def codes_of(self, database):
         status, text, messages = verify("--json", database)
         self.assertEqual((status, messages), (0, ""), text)
-        return [finding["code"] for finding in json.loads(text)[0]["findings"]]
+        return [finding["code"] for finding in json.loads(text)["files"][0]["findings"]]
 
     def test_golden_sources_in_both_orders(self):
         expected = expected_warnings()

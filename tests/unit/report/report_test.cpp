@@ -62,18 +62,59 @@ TEST(Text, ShowsAFindingAndItsNotes) {
                                            "f:1:1: note: there\n    1 | ab\n      | ^~\n");
 }
 
-TEST(Sarif, HasColumnsInCharacters) {
-    check::finding found = {
-        .error = true, .code = "S106", .name = "error", .text = "t", .at = {3, 3, 1}, .source = "\u00e4b", .notes = {}};
-    std::string text = report::as_sarif(std::vector<report::checked_source>{{"f", {found}, {1, 0}}});
-    EXPECT_NE(text.find("\"startColumn\": 2,"), std::string::npos);
-    EXPECT_NE(text.find("\"endColumn\": 3"), std::string::npos);
+using make_form = std::unique_ptr<report::writer>(report::output);
+
+/* What a form makes of one source with one finding. */
+std::string written(make_form *make, const check::finding &found) {
+    std::string text;
+    std::unique_ptr<report::writer> to = make([&text](std::string_view part) { text += part; });
+    to->begin_source("f");
+    to->add(found);
+    to->end_source({2, 3});
+    to->close();
+    return text;
 }
 
-TEST(Json, CountsTheFindings) {
-    std::string text = report::as_json(std::vector<report::checked_source>{{"f", {}, {2, 3}}});
-    EXPECT_EQ(text,
-              "[\n  {\n    \"file\": \"f\",\n    \"errors\": 2,\n    \"warnings\": 3,\n    \"findings\": []\n  }\n]\n");
+/* A finding in "\u00e4b". */
+const check::finding AFTER_UMLAUT = {
+    .error = true, .code = "S106", .name = "error", .text = "t", .at = {3, 3, 1}, .source = "\u00e4b", .notes = {}};
+
+TEST(Sarif, HasColumnsInCharacters) {
+    std::string text = written(report::sarif_form, AFTER_UMLAUT);
+    EXPECT_NE(text.find("\"startColumn\":2,"), std::string::npos);
+    EXPECT_NE(text.find("\"endColumn\":3"), std::string::npos);
+}
+
+TEST(Json, HasPlacesInBytesAndInCharacters) {
+    EXPECT_EQ(written(report::json_form, AFTER_UMLAUT), R"({
+  "schema": "cdef-check.schema.json",
+  "version": 1,
+  "sources": [
+    {
+      "file": "f",
+      "findings": [
+        {
+          "code": "S106",
+          "severity": "error",
+          "name": "error",
+          "message": "t",
+          "line": 3,
+          "column": 3,
+          "length": 1,
+          "character_column": 2,
+          "character_length": 1,
+          "source": "\u00e4b",
+          "notes": []
+        }
+      ],
+      "errors": 2,
+      "warnings": 3
+    }
+  ],
+  "errors": 2,
+  "warnings": 3
+}
+)");
 }
 
 } // namespace

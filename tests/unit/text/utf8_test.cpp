@@ -38,3 +38,12 @@ TEST(text_utf8, decode) {
     EXPECT_EQ(text::decode("\xE2\x82\xAC"), U'\u20AC');
     EXPECT_EQ(text::decode("\xF0\x9F\x98\x80"), U'\U0001F600');
 }
+
+TEST(text_utf8, length_of_what_is_replaced) {
+    EXPECT_EQ(text::length_replaced(""), 0U);
+    EXPECT_EQ(text::length_replaced("\xC3\xA4x"), 2U);
+    EXPECT_EQ(text::length_replaced("\xE2\x82x"), 2U);
+    EXPECT_EQ(text::length_replaced("\xF0\x9F\x98"), 3U);
+    EXPECT_EQ(text::length_replaced("\xF0\x8F\xBF\xBF"), 1U);
+    EXPECT_EQ(text::length_replaced("\x80\x80"), 1U);
+}

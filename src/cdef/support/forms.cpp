@@ -1,0 +1,27 @@
+/* forms.cpp: the option that chooses the form of what a subcommand shows. */
+
+#include "cdef/support/forms.h"
+
+#include <CLI/CLI.hpp>
+
+#include <algorithm>
+
+namespace cdef {
+
+void add_forms(CLI::App &command, std::string &form, const std::vector<std::string> &forms, const std::string &help) {
+    form = forms.front();
+    CLI::Option *format = command.add_option("--format", form, help)->check(CLI::IsMember(forms));
+    CLI::Option *former = nullptr;
+    for (const std::string short_form : {"json", "hex"}) {
+        if (std::find(forms.begin(), forms.end(), short_form) == forms.end())
+            continue;
+        auto choose = [&form, short_form] { form = short_form; };
+        CLI::Option *flag = command.add_flag_callback("--" + short_form, choose, "Short for --format " + short_form);
+        flag->excludes(format);
+        if (former != nullptr)
+            flag->excludes(former);
+        former = flag;
+    }
+}
+
+} // namespace cdef

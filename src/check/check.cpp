@@ -7,6 +7,7 @@
 #include <fcntl.h>
 #include <memory>
 #include <unistd.h>
+#include <utility>
 
 namespace check {
 
@@ -14,15 +15,19 @@ namespace {
 
 /* One check of one source, whose name must stay as long. */
 struct source_check {
-    source_check(const std::string &name, const warning_set &wanted) : compiler(name.c_str()), warned(wanted, found) {}
+    source_check(const std::string &name, const warning_set &wanted, const sink &handed_to)
+        : compiler(name.c_str()), to(handed_to), warned(wanted, found) {}
 
-    totals run(const sink &to);
+    totals run();
     void take(const source_line &source);
+    void hand_over(finding &&each);
 
     compilation compiler;
     current_line line;
     knowledge known;
-    findings found;
+    const sink &to;
+    findings found{[this](finding &&each) { hand_over(std::move(each)); },
+                   [this](warning_id id, int at_line) { return recover.may_retract(id, at_line); }};
     const view see = {compiler, line, known, found};
     watchers warned;
     recovery recover = {compiler, line, known, found, see, warned};
@@ -43,7 +48,14 @@ void source_check::take(const source_line &source) {
         recover.take_attribute();
 }
 
-totals source_check::run(const sink &to) {
+void source_check::hand_over(finding &&each) {
+    line.find_in_file(each.at);
+    for (note &more : each.notes)
+        line.find_in_file(more.at);
+    to(std::move(each));
+}
+
+totals source_check::run() {
     for (;;) {
         source_line source = compiler.next_line();
         if (source.begin == nullptr)
@@ -53,30 +65,25 @@ totals source_check::run(const sink &to) {
     compiler.close();
     line.end_source();
     recover.close_all();
-    return found.hand_over([&](finding &&each) {
-        line.find_in_file(each.at);
-        for (note &more : each.notes)
-            line.find_in_file(more.at);
-        to(std::move(each));
-    });
+    return found.close();
 }
 
 } // namespace
 
 totals check_bytes(std::string_view bytes, const std::string &name, const warning_set &wanted, const sink &to) {
-    auto one = std::make_unique<source_check>(name, wanted);
+    auto one = std::make_unique<source_check>(name, wanted, to);
     one->compiler.open_bytes(bytes);
-    return one->run(to);
+    return one->run();
 }
 
 totals check_file(const std::string &path, const warning_set &wanted, const sink &to) {
-    auto one = std::make_unique<source_check>(path, wanted);
+    auto one = std::make_unique<source_check>(path, wanted, to);
     try {
         if (path == "-") /* by its descriptor: it may not be a file, or be half read */
             one->compiler.open(fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
         else
             one->compiler.open();
-        return one->run(to);
+        return one->run();
     } catch (const fatal_exit &failure) {
         throw cannot_check(text_of(failure));
     }

@@ -74,7 +74,7 @@ struct place {
     int line = 0;      /* as the compiler counts lines; 0: none */
     size_t column = 0; /* in bytes, from 1; 0: the whole line */
     size_t length = 0; /* in bytes */
-    /* The same in the file, where a newline ends each line. Set once all of the source has been read. */
+    /* The same in the file, where a newline ends each line. Set when a finding is handed over. */
     int file_line = 0;
     size_t file_column = 0;
 };
@@ -118,7 +118,8 @@ struct totals {
     size_t warnings = 0;
 };
 
-/* Is given each finding, by line; the errors of a line come before its warnings. */
+/* Is given each finding, as soon as about a thousand later ones have been found: by line, and the errors of a line
+ * before its warnings, but a finding about a line far in front of the others comes when it is found. */
 using sink = std::function<void(finding &&)>;
 
 /* The source cannot be read, or memory ran out. The text names the source. */

@@ -1,4 +1,4 @@
-/* findings.cpp: what has been found so far. */
+/* findings.cpp: what has been found, on its way to whoever wants it. */
 
 #include "check/findings.h"
 
@@ -7,53 +7,83 @@
 
 namespace check {
 
+finding &findings::add(entry &&added) {
+    make_room();
+    waiting.push_back(std::move(added));
+    return waiting.back().found;
+}
+
 finding &findings::error(const message &known, const place &at, std::string_view source, std::string text) {
     ++count.errors;
-    entries.push_back({{.error = true,
-                        .code = known.code,
-                        .name = "error",
-                        .text = std::move(text),
-                        .at = at,
-                        .source = std::string(source),
-                        .notes = {}}});
-    return entries.back().found;
+    finding found = {.error = true,
+                     .code = known.code,
+                     .name = "error",
+                     .text = std::move(text),
+                     .at = at,
+                     .source = std::string(source),
+                     .notes = {}};
+    return add({std::move(found), WARNING_COUNT});
 }
 
 finding &findings::warn(const warning &known, const place &at, std::string_view source, std::string text, note more) {
     ++count.warnings;
-    of_warning[known.id].push_back(entries.size());
-    entries.push_back({{.error = false,
-                        .code = known.code,
-                        .name = known.name,
-                        .text = std::move(text),
-                        .at = at,
-                        .source = std::string(source),
-                        .notes = {}}});
+    finding found = {.error = false,
+                     .code = known.code,
+                     .name = known.name,
+                     .text = std::move(text),
+                     .at = at,
+                     .source = std::string(source),
+                     .notes = {}};
     if (!more.text.empty())
-        entries.back().found.notes.push_back(std::move(more));
-    return entries.back().found;
+        found.notes.push_back(std::move(more));
+    return add({std::move(found), known.id});
 }
 
 void findings::retract(warning_id id, int line) {
-    const std::vector<size_t> &positions = of_warning[id];
-    for (size_t left = positions.size(); left > 0; --left) {
-        entry &each = entries[positions[left - 1]];
-        if (each.found.at.line < line)
-            return;
-        if (each.found.at.line != line || each.retracted)
+    for (entry &each : waiting) {
+        if (each.id != id || each.found.at.line != line || each.retracted)
             continue;
         each.retracted = true;
         --count.warnings;
     }
 }
 
-totals findings::hand_over(const sink &to) {
-    std::erase_if(entries, [](const entry &each) { return each.retracted; });
-    std::stable_sort(entries.begin(), entries.end(), [](const entry &a, const entry &b) {
+void findings::sort() {
+    auto before = [](const entry &a, const entry &b) {
         return std::pair(a.found.at.line, !a.found.error) < std::pair(b.found.at.line, !b.found.error);
-    });
-    for (entry &each : entries)
+    };
+    if (!std::is_sorted(waiting.begin(), waiting.end(), before))
+        std::stable_sort(waiting.begin(), waiting.end(), before);
+}
+
+void findings::hand_over(entry &each) {
+    if (!each.retracted)
         to(std::move(each.found));
+}
+
+/* Hands over half of what waits, that of the first lines, if too much waits. */
+void findings::make_room() {
+    if (waiting.size() < room)
+        return;
+    sort();
+    std::vector<entry> kept;
+    for (size_t i = 0; i < waiting.size(); ++i) {
+        entry &each = waiting[i];
+        bool is_open = each.id != WARNING_COUNT && !each.retracted && may_retract(each.id, each.found.at.line);
+        if (is_open || i >= waiting.size() / 2)
+            kept.push_back(std::move(each));
+        else
+            hand_over(each);
+    }
+    waiting = std::move(kept);
+    room = std::max(WAITING_MAX, 2 * waiting.size());
+}
+
+totals findings::close() {
+    sort();
+    for (entry &each : waiting)
+        hand_over(each);
+    waiting.clear();
     return count;
 }
 

@@ -54,6 +54,20 @@ bool recovery::is_reported_otherwise(const fatal_exit &failure) const {
     }
 }
 
+bool recovery::may_retract(warning_id id, int at_line) const {
+    const std::vector<mention> &without = known.run.without_index;
+    switch (id) {
+    case NARROWED:
+        return at_line == known.overflow_line;
+    case INCOMPLETE:
+        return at_line == known.map_line || (!without.empty() && at_line >= without.front().at.line);
+    case ELEMENT_TYPE:
+        return known.kind >= 0 && at_line == known.stanza().data_type.at.line;
+    default:
+        return false;
+    }
+}
+
 /* The kind whose completion failed. */
 int recovery::failed_kind(const fatal_exit &failure) const {
     int kind = failure.record;

@@ -25,6 +25,9 @@ public:
     /* The end of the source. (recover_end.cpp) */
     void close_all();
 
+    /* Whether a warning of a line may be taken back by what follows. */
+    bool may_retract(warning_id id, int at_line) const;
+
     /* Carriage returns at the ends of lines are passed over. */
     bool strips_returns() const {
         return strip_returns;

@@ -4,7 +4,10 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <string>
+#include <utility>
+#include <vector>
 
 namespace {
 
@@ -20,13 +23,17 @@ protected:
     }
     /* "S103 5, " for each. */
     std::string handed_over() {
+        count = found.close();
         std::string all;
-        count = found.hand_over(
-            [&](check::finding &&each) { all += std::string(each.code) + " " + std::to_string(each.at.line) + ", "; });
+        for (const check::finding &each : given)
+            all += std::string(each.code) + " " + std::to_string(each.at.line) + ", ";
         return all;
     }
 
-    findings found;
+    std::vector<check::finding> given;
+    int open_line = 0; /* whose warnings may still be taken back */
+    findings found{[this](check::finding &&each) { given.push_back(std::move(each)); },
+                   [this](check::warning_id, int line) { return line == open_line; }};
     check::totals count;
 };
 
@@ -56,9 +63,43 @@ TEST_F(Findings, TakeBackTheWarningsOfALine) {
 TEST_F(Findings, KeepTheNoteOfAWarning) {
     found.warn(check::warnings[check::OCTAL], {1, 0, 0}, "", "text", {{1, 0, 0}, "note"});
     found.warn(check::warnings[check::OCTAL], {1, 0, 0}, "", "text", {{1, 0, 0}, ""});
-    std::vector<size_t> notes;
-    found.hand_over([&](check::finding &&each) { notes.push_back(each.notes.size()); });
-    EXPECT_EQ(notes, (std::vector<size_t>{1, 0}));
+    found.close();
+    EXPECT_EQ(given.at(0).notes.size(), 1u);
+    EXPECT_EQ(given.at(1).notes.size(), 0u);
+}
+
+TEST_F(Findings, AreHandedOverBeforeTheEndIfThereAreMany) {
+    for (int line = 1; line <= 10'000; ++line)
+        error(line);
+    EXPECT_GT(given.size(), 8'000u);
+    EXPECT_LT(given.size(), 10'000u);
+    EXPECT_EQ(found.close().errors, 10'000u);
+    for (size_t i = 0; i < given.size(); ++i)
+        EXPECT_EQ(given[i].at.line, static_cast<int>(i) + 1);
+}
+
+TEST_F(Findings, WaitForOnesOfEarlierLines) {
+    for (int line = 1; line <= 10'000; ++line) {
+        error(line);
+        if (line % 100 == 0)
+            warn(check::OCTAL, line - 99);
+    }
+    found.close();
+    auto by_line = [](const check::finding &a, const check::finding &b) { return a.at.line < b.at.line; };
+    EXPECT_EQ(given.size(), 10'100u);
+    EXPECT_TRUE(std::is_sorted(given.begin(), given.end(), by_line));
+}
+
+TEST_F(Findings, CanBeTakenBackAsLongAsTheyMustBe) {
+    open_line = 1;
+    warn(check::OCTAL, 1);
+    warn(check::OCTAL, 2);
+    for (int line = 3; line <= 10'000; ++line)
+        error(line);
+    EXPECT_EQ(given.front().at.line, 2);
+    found.retract(check::OCTAL, 1);
+    EXPECT_EQ(found.close().warnings, 1u);
+    EXPECT_EQ(given.size(), 9'999u);
 }
 
 } // namespace

@@ -71,7 +71,8 @@ struct stanza_record {
     place header;
     std::string source; /* the header's line */
     given_lines given = {};
-    bool repeated = false; /* a required attribute has been given again, and none for the first time since */
+    int ordinal = 0;      /* among all stanzas, from 1 */
+    bool suspect = false; /* one line of it may belong to another stanza, and none was new since */
     refused_attributes refused;
     mention data_type;      /* the value of its DataType */
     bool misplaced = false; /* it seems to contain lines of another stanza */
@@ -81,6 +82,16 @@ struct stanza_record {
 struct incomplete_stanza {
     int kind = NO_KIND; /* NO_KIND: there is none, or the missing lines are elsewhere */
     given_lines given = {};
+};
+
+/* Attributes of one stanza. */
+struct stanza_attributes {
+    bool has(std::string_view name) const {
+        return std::find(names.begin(), names.end(), name) != names.end();
+    }
+
+    int ordinal = 0; /* of the stanza; 0: none */
+    language::name_list names;
 };
 
 /* Stanzas whose headers could not be understood. */
@@ -121,7 +132,10 @@ struct knowledge {
     bool skipping = false;     /* nothing of the current stanza can be understood */
     bool class_forged = false; /* the open class has no stanza */
     std::array<stanza_record, SC_COUNT> stanzas;
-    incomplete_stanza split; /* the stanza before the current one */
+    incomplete_stanza split;   /* the stanza before the current one */
+    stanza_attributes lacking; /* of the latest stanza reported as lacking some; the next one may have them twice */
+    stanza_attributes twice;   /* of the latest stanza reported as having some twice; the next one may lack them */
+    int stanzas_begun = 0;
     lost_stanzas lost;
     element_run run;
     declarations declared;

@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <vector>
 
 namespace check {
 
@@ -39,6 +40,10 @@ const char *form_of(vx_data_type_t type) {
     }
 }
 
+mention header_of(const stanza_record &stanza) {
+    return {stanza.header, {}, stanza.source};
+}
+
 /* One error while its notes are added. */
 struct noting {
     const view &see;
@@ -51,9 +56,10 @@ struct noting {
     void add_here(std::string text) {
         add(found.at, std::move(text));
     }
-    /* For an error without a place of its own: the line is shown. */
+    /* For an error in another line, or without any: the line is shown. */
     void show(const mention &shown, std::string text) {
-        found.notes.push_back({shown.at, std::move(text), shown.source});
+        bool is_shown = shown.at.line == found.at.line && found.at.column != 0;
+        found.notes.push_back({shown.at, std::move(text), is_shown ? "" : shown.source});
     }
     /* What was meant takes the place of what is marked. */
     void replace(const language::guess &meant) {
@@ -68,7 +74,7 @@ struct noting {
             add({line, 0, 0}, "first given here");
     }
     void show_missing() {
-        show({stanza().header, {}, stanza().source}, "this " + kind_name() + " lacks " + listed(missing()));
+        show(header_of(stanza()), "this " + kind_name() + " lacks " + listed(missing()));
     }
 
     std::string kind_name() const {
@@ -171,18 +177,22 @@ void bad_value(noting &n) {
         n.add_here(quoted(vxTypeStr[type]) + " takes " + form_of(type));
 }
 
-bool is_expected_index(const finding &found, const view &see) {
-    std::string text(see.line.at(found.at));
+bool is_expected_index(const view &see) {
+    std::string text(see.value());
     return std::strtol(text.c_str(), nullptr, 10) == see.compiler.expected_index();
 }
 
+std::string expected_index(const view &see) {
+    return "expected is " + std::to_string(see.compiler.expected_index());
+}
+
 void wrong_index(noting &n) {
-    if (n.see.known.overflow_line != 0 && is_expected_index(n.found, n.see))
+    if (n.see.known.overflow_line != 0 && is_expected_index(n.see))
         overflowed(n);
-    else
-        n.add_here("expected is " + std::to_string(n.see.compiler.expected_index()));
+    else if (n.found.at.line == n.see.line.number)
+        n.add_here(expected_index(n.see));
     for (const mention &header : n.see.known.run.without_index)
-        n.show(header, lacks_index(n.kind));
+        n.show(header, "this " + n.kind_name() + " lacks `ElementIndex`");
 }
 
 void bad_default(noting &n) {
@@ -194,16 +204,18 @@ void bad_default(noting &n) {
 
 void no_manager(noting &n) {
     n.kind = SC_CLASS_TO_MANAGER_MAPPING;
-    n.show({n.stanza().header, {}, n.stanza().source}, "this `ClassToManagerMapping` lacks `ResourceManager`");
+    n.show(header_of(n.stanza()), "this `ClassToManagerMapping` lacks `ResourceManager`");
 }
 
 void keys(noting &n) {
     n.kind = SC_CLASS_TO_MANAGER_MAPPING;
-    for (const char *key : {"FirstKey", "LastKey"})
-        if (const mention *given = map_value(n.see.known, key))
-            n.show(*given, given->text + " is given here");
-        else
-            n.show_missing();
+    if (const mention *first = map_value(n.see.known, "FirstKey");
+        first != nullptr && first->at.line != n.found.at.line)
+        n.show(*first, "the first key");
+    if (const mention *last = map_value(n.see.known, "LastKey"))
+        n.show(*last, "the last key, which may not be less: swap the two");
+    else
+        n.show_missing();
 }
 
 struct notes_of {
@@ -246,16 +258,73 @@ void add_notes(finding &found, const fatal_exit &failure, int kind, const view &
             each.add(n);
 }
 
-std::string lacks_index(int kind) {
-    return "this " + quoted(table_of(kind).sc_name) + " lacks `ElementIndex`";
-}
-
-bool blames_overflow(const finding &found, const fatal_exit &failure, const view &see) {
+bool blames_overflow(const fatal_exit &failure, const view &see) {
     if (see.known.overflow_line == 0)
         return false;
     if (failure.id == MSG_INDEX_NOT_CONSECUTIVE)
-        return is_expected_index(found, see);
+        return is_expected_index(see);
     return failure.id == MSG_INVALID_VALUE && is_numeric(see.compiler.data_type());
+}
+
+/* ---- Where an error's cause is ---------------------------------------------------------------------------------- */
+
+namespace {
+
+/* An index that is wrong only because elements before it have none: the first of them. */
+std::optional<mention> element_without_index(const view &see) {
+    const std::vector<mention> &without = see.known.run.without_index;
+    long left_out = see.compiler.element_index() - long{see.compiler.expected_index()};
+    if (without.empty() || left_out != static_cast<long>(without.size()))
+        return std::nullopt;
+    return without.front();
+}
+
+/* The DataType that is none, or that cannot be used where it is. */
+std::optional<mention> wrong_type(int kind, const view &see) {
+    const std::vector<mention> &odd = see.known.run.odd_types;
+    if (is_sd_kind(kind) && !odd.empty())
+        return odd.front();
+    return is_sd_kind(kind) ? std::nullopt : std::optional(see.known.stanzas[index_of(kind)].data_type);
+}
+
+std::optional<mention> unknown_type_of_value(int kind, const view &see) {
+    bool overflow = is_numeric(see.compiler.data_type()) && see.known.overflow_line != 0;
+    if (overflow || see.compiler.data_type() != VX_UNKNOWN)
+        return std::nullopt;
+    return see.known.stanzas[index_of(kind)].data_type;
+}
+
+std::optional<mention> reversed_key(const view &see) {
+    const mention *first = map_value(see.known, "FirstKey");
+    if (first == nullptr || map_value(see.known, "LastKey") == nullptr)
+        return header_of(see.known.stanzas[SC_CLASS_TO_MANAGER_MAPPING]);
+    return *first;
+}
+
+} // namespace
+
+std::optional<mention> cause_of(const fatal_exit &failure, int kind, const view &see) {
+    switch (failure.id) {
+    case MSG_INDEX_NOT_CONSECUTIVE:
+        return element_without_index(see);
+    case MSG_INVALID_VALUE:
+        return unknown_type_of_value(kind, see);
+    case MSG_SBS_TYPE:
+    case MSG_NO_ELEMENT_DEFAULT:
+    case MSG_NO_ELEMENT_INITIAL:
+        return wrong_type(kind, see);
+    case MSG_NO_MANAGER:
+        return header_of(see.known.stanzas[SC_CLASS_TO_MANAGER_MAPPING]);
+    case MSG_KEYS_REVERSED:
+        return reversed_key(see);
+    default:
+        return std::nullopt;
+    }
+}
+
+std::string stops_here(const fatal_exit &failure, const view &see) {
+    std::string text = "the compiler stops here";
+    return failure.id == MSG_INDEX_NOT_CONSECUTIVE ? text + ": " + expected_index(see) : text;
 }
 
 const mention *map_value(const knowledge &known, std::string_view attribute) {

@@ -5,7 +5,7 @@
 #include "check/recovery.h"
 #include "language/names.h"
 
-#include <vector>
+#include <algorithm>
 
 namespace check {
 
@@ -114,12 +114,9 @@ void recovery::recover_attribute(const fatal_exit &failure) {
         return lose_first_header(failure);
     const attr_place latest = compiler.latest();
     bool consequence = follows(failure);
-    if (!consequence && blames_element(failure)) {
-        report_element_without_index(failure);
-    } else if (!consequence && may_follow(failure)) {
-        finding &error = report(failure, line.marked(message_of(failure.id).mark, latest, failure.detail1));
-        add_notes(error, failure, known.kind, see);
-        if (blames_overflow(error, failure, see))
+    if (!consequence && may_follow(failure)) {
+        report_with_notes(failure, line.marked(message_of(failure.id).mark, latest, failure.detail1), known.kind);
+        if (blames_overflow(failure, see))
             found.retract(NARROWED, known.overflow_line);
     }
     recover_value(failure, consequence);
@@ -173,9 +170,11 @@ std::optional<int> recovery::type_meant() const {
 /* Whether an attribute's error is a consequence of one that has been reported. */
 bool recovery::follows(const fatal_exit &failure) {
     if (failure.id == MSG_INDEX_NOT_CONSECUTIVE)
-        return index_lost || (other_index >= 0 && compiler.element_index() == other_index);
+        return index_lost || is_other_index();
     if (failure.id == MSG_NO_STRING_TABLE)
         return is_reported_otherwise(failure);
+    if (is_line_of_neighbour(failure, known.kind))
+        return true;
     const attr_place &latest = compiler.latest();
     bool typed = latest.attr != nullptr && is_typed(latest.attr->ta_type);
     bool untyped =
@@ -189,52 +188,46 @@ bool recovery::follows(const fatal_exit &failure) {
     return is_misplaced(failure);
 }
 
+/* Whether a value may be refused only because its line belongs to a stanza of another kind. */
+bool recovery::is_foreign_value(const fatal_exit &failure) const {
+    return failure.id == MSG_INVALID_VALUE || failure.id == MSG_NO_VALID_VALUE || failure.id == MSG_ELEMENT_DEFAULT ||
+           is_foreign_property(failure);
+}
+
+bool recovery::is_foreign_property(const fatal_exit &failure) const {
+    if (failure.id != MSG_INVALID_PROPERTY)
+        return false;
+    std::string_view name = line.at(line.marked(mark_kind::item, compiler.latest(), failure.detail1));
+    for (int type : {AT_CLASS_PROPS, AT_PATTR_PROPS, AT_DATTR_PROPS, AT_ACTION_PROPS})
+        if (language::name_list names = language::property_names(type);
+            std::find(names.begin(), names.end(), name) != names.end())
+            return true;
+    return false;
+}
+
 /* Whether a line belongs to another stanza, as one before it did. The first such line is only noted: a second name, or
- * an attribute that other kinds have and this one has not. Other required attributes that are repeated one after
- * the other are the lines of one more stanza: the first of them has been reported. */
+ * an attribute that other kinds have and this one has not. Before it there may be a line that makes the stanza suspect,
+ * and has been reported: a required attribute that is repeated, or a property of another kind. */
 bool recovery::is_misplaced(const fatal_exit &failure) {
+    stanza_record &stanza = known.stanza();
     bool unknown = failure.id == MSG_UNKNOWN_ATTRIBUTE && !type_meant();
     bool repeated = failure.id == MSG_REPEATED_ATTRIBUTE;
-    bool &before = known.stanza().misplaced;
-    if (before)
-        return unknown || repeated || failure.id == MSG_INVALID_VALUE || failure.id == MSG_NO_VALID_VALUE;
+    if (stanza.misplaced)
+        return unknown || repeated || is_foreign_value(failure);
     bool first_attribute = compiler.latest().attr == table_of(known.kind).sc_attrs.data();
     bool named = repeated && (first_attribute || is_name(name_given()));
-    bool required = repeated && (see.attr().req_bit & OPTIONAL) == 0;
-    bool again = required && known.stanza().repeated;
-    known.stanza().repeated = known.stanza().repeated || required;
+    bool again = stanza.suspect && (repeated || unknown);
+    stanza.suspect =
+        stanza.suspect || (repeated && (see.attr().req_bit & OPTIONAL) == 0) || is_foreign_property(failure);
     kind_set kinds = unknown || named || again ? language::kinds_with(name_given()) : kind_set();
-    before = kinds.any();
-    if (!before)
+    stanza.misplaced = kinds.any();
+    if (!stanza.misplaced)
         return false;
     lose_header(kinds);
     index_lost = index_lost || is_sd_kind(known.kind); /* this may be another run */
     if (int previous = compiler.previous_kind(); unknown && previous >= 0)
         break_if_incomplete(previous); /* what it lacks may be here */
     return again;
-}
-
-/* ---- Wrong indexes ---------------------------------------------------------------------------------------------- */
-
-/* Whether an index is wrong only because elements before it have none. An error of a line between them comes first, as
- * the compiler prints it first. */
-bool recovery::blames_element(const fatal_exit &failure) const {
-    const std::vector<mention> &without = known.run.without_index;
-    if (failure.id != MSG_INDEX_NOT_CONSECUTIVE || without.empty() || error_line > without.front().at.line)
-        return false;
-    return compiler.element_index() - static_cast<long>(without.size()) == compiler.expected_index();
-}
-
-void recovery::report_element_without_index(const fatal_exit &failure) {
-    const std::vector<mention> &without = known.run.without_index;
-    finding &error = report(failure, without.front().at);
-    error.source = without.front().source;
-    for (const mention &header : without)
-        error.notes.push_back(
-            {header.at, lacks_index(known.kind), header.at.line == error.at.line ? "" : header.source});
-    error.notes.push_back({see.value_place(),
-                           "the compiler refuses this index: it expects " + std::to_string(compiler.expected_index()),
-                           std::string(line.raw)});
 }
 
 /* ---- What an error leaves to be done, besides its stanza's being broken ----------------------------------------- */
@@ -253,12 +246,22 @@ void recovery::recover_value(const fatal_exit &failure, bool consequence) {
         report_type_here();
 }
 
-/* After a wrong index the count either continues from it, or skips it. */
+/* After a wrong index: whether this one skips it, or changed places with it. */
+bool recovery::is_other_index() const {
+    int index = compiler.element_index();
+    return index >= 0 && (index == other_index || index == awaited_index);
+}
+
+/* After a wrong index the count either continues from it, or skips it. One that is not taken leaves the one before. */
 void recovery::recover_index(bool consequence) {
     int expected = compiler.expected_index();
+    number given(see.value(), 10);
+    bool read = given.read == see.value().size() && given.value == compiler.element_index();
+    bool awaited = consequence && !index_lost && compiler.element_index() == awaited_index;
+    if (!awaited)
+        compiler.expect_index(read ? compiler.element_index() + 1 : expected + 1);
     other_index = consequence ? -1 : expected + 1;
-    bool read = compiler.element_index() + 1 != expected;
-    compiler.expect_index(read ? compiler.element_index() + 1 : expected + 1);
+    awaited_index = consequence ? -1 : expected;
     index_lost = false;
 }
 

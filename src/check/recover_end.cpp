@@ -34,7 +34,8 @@ void recovery::close_all() {
 bool recovery::recover_end(const fatal_exit &failure) {
     int failed = failed_kind(failure);
     bool reported = failed >= 0 && compiler.is_broken(failed);
-    if (!reported && !is_reported_otherwise(failure) && may_follow(failure)) {
+    bool elsewhere = failed >= 0 && is_line_of_neighbour(failure, failed);
+    if (!reported && !elsewhere && !is_reported_otherwise(failure) && may_follow(failure)) {
         report_with_notes(failure, line.none(), failed);
         if (failure.id == MSG_KEYS_REVERSED && map_value(known, "LastKey") == nullptr)
             found.retract(INCOMPLETE, known.map_line);

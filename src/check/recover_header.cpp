@@ -80,7 +80,7 @@ void recovery::open_stanza(int kind, bool broken) {
     bool same_run = known.kind == kind && is_sd_kind(kind);
     if (!same_run) { /* after a mistake it may be the rest of a run */
         index_lost = known.kind < 0 || compiler.is_broken(known.kind);
-        other_index = -1;
+        other_index = awaited_index = -1;
         known.run.odd_types.clear();
         known.run.odd_type_reported = false;
         known.run.without_index.clear();
@@ -94,7 +94,8 @@ void recovery::open_stanza(int kind, bool broken) {
     compiler.set_broken(kind, broken);
     stanza_record &stanza = known.stanza();
     stanza.given.fill(0);
-    stanza.repeated = false;
+    stanza.ordinal = ++known.stanzas_begun;
+    stanza.suspect = false;
     stanza.refused = {};
     stanza.misplaced = false;
     stanza.data_type.at = {};
@@ -127,7 +128,8 @@ bool recovery::recover_header(const fatal_exit &failure, int kind) {
 /* The header completes a record, which failed. */
 bool recovery::recover_completion(const fatal_exit &failure) {
     int failed = failed_kind(failure);
-    if (!compiler.is_broken(failed) && !is_reported_otherwise(failure) && may_follow(failure))
+    if (!compiler.is_broken(failed) && !is_reported_otherwise(failure) && !is_line_of_neighbour(failure, failed) &&
+        may_follow(failure))
         report_with_notes(failure, line.none(), failed);
     if (failed == known.kind && found.errors() > errors_before_header && !known.stanza().is_empty())
         known.split = {failed, known.stanza().given};
@@ -173,6 +175,8 @@ void recovery::unknown_header(const attr_text &text, const fatal_exit &failure) 
         return take_header(line.replaced(*stripped), false);
     if (line.continues)
         return add("this is the rest of a line of more than " + std::to_string(LINE_MAX_CHARS - 1) + " characters");
+    if (take_joined_header(name, error))
+        return;
     if (front.size() < name.size() && !is_header(front) && known.kind >= 0) {
         add("an attribute line begins with a blank or a tab");
         return take_quietly(std::string("\t").append(name), 1);
@@ -184,6 +188,19 @@ void recovery::unknown_header(const attr_text &text, const fatal_exit &failure) 
     if (!meant.name.empty())
         return take_header(line.replaced(meant.name), true);
     lose_stanza();
+}
+
+/* A header and an attribute line in one. */
+bool recovery::take_joined_header(std::string_view name, finding &error) {
+    size_t blank = name.find_first_of(" \t");
+    if (blank == std::string_view::npos || !is_header(name.substr(0, blank)))
+        return false;
+    error.notes.push_back({line.all(), "a header has a line of its own"});
+    std::string attribute(name.substr(blank));
+    take_header(line.replaced(std::string(name.substr(0, blank))), true);
+    if (known.kind >= 0 && attribute.find('=') != std::string::npos)
+        take_quietly(attribute, 0);
+    return true;
 }
 
 /* A header without what cannot be seen of it; nothing if that is not what is wrong with it. */

@@ -5,6 +5,7 @@
 #include "check/lacking.h"
 #include "check/notes.h"
 
+#include <algorithm>
 #include <utility>
 
 namespace check {
@@ -23,8 +24,18 @@ finding &recovery::report(const fatal_exit &failure, const place &at) {
     return found.error(row, at, line.raw, text_of(failure));
 }
 
-void recovery::report_with_notes(const fatal_exit &failure, const place &at, int kind) {
-    add_notes(report(failure, at), failure, kind, see);
+/* Reports an error where its cause is, if that is known, and otherwise where the compiler met it. The compiler prints
+ * the first error that it meets, so a cause in front of one that has been reported does not become the error's place.
+ */
+void recovery::report_with_notes(const fatal_exit &failure, const place &met, int kind) {
+    std::optional<mention> cause = cause_of(failure, kind, see);
+    bool moves = cause && cause->at.line > error_line;
+    finding &error = report(failure, moves ? cause->at : met);
+    add_notes(error, failure, kind, see);
+    if (!moves)
+        return;
+    error.source = cause->source;
+    error.notes.push_back({met, stops_here(failure, see), met.column == 0 ? "" : std::string(line.raw)});
 }
 
 /* Whether an error may be a mistake of its own. One that no source causes is not, after others. */
@@ -66,6 +77,26 @@ bool recovery::may_retract(warning_id id, int at_line) const {
     default:
         return false;
     }
+}
+
+/* Whether a line of one stanza is in the next one, or the other way round, which has been reported for the first of the
+ * two: one lacks what the other has twice. */
+bool recovery::is_line_of_neighbour(const fatal_exit &failure, int kind) {
+    int ordinal = known.stanzas[index_of(kind)].ordinal;
+    if (failure.id == MSG_REPEATED_ATTRIBUTE) {
+        if (known.lacking.ordinal == ordinal - 1 && known.lacking.has(see.attr().ta_name))
+            return true;
+        if (known.twice.ordinal != ordinal)
+            known.twice = {ordinal, {}};
+        known.twice.names.emplace_back(see.attr().ta_name);
+        return false;
+    }
+    if (failure.id != MSG_OPTIONAL_TOO_EARLY && failure.id != MSG_INCOMPLETE_STANZA)
+        return false;
+    known.lacking = {ordinal, compiler.missing(kind)};
+    return known.twice.ordinal == ordinal - 1 &&
+           std::all_of(known.lacking.names.begin(), known.lacking.names.end(),
+                       [&](std::string_view name) { return known.twice.has(name); });
 }
 
 /* The kind whose completion failed. */
@@ -142,7 +173,7 @@ void recovery::note_given() {
     int &given = known.stanza().given[at];
     if (given == 0) {
         given = line.number;
-        known.stanza().repeated = false;
+        known.stanza().suspect = false;
     }
     if (known.kind == SC_CLASS_TO_MANAGER_MAPPING)
         known.map_values.push_back({see.value_place(), latest.attr->ta_name, std::string(line.raw)});

@@ -38,8 +38,9 @@ private:
     finding &report(const fatal_exit &failure, const place &at);
     bool may_follow(const fatal_exit &failure) const;
     bool is_reported_otherwise(const fatal_exit &failure) const;
+    bool is_line_of_neighbour(const fatal_exit &failure, int kind);
     int failed_kind(const fatal_exit &failure) const;
-    void report_with_notes(const fatal_exit &failure, const place &at, int kind);
+    void report_with_notes(const fatal_exit &failure, const place &met, int kind);
 
     /* Stanzas and records (recovery.cpp). */
     void end_stanza(int next_kind);
@@ -65,6 +66,7 @@ private:
     void begin_stray_run(int kind, bool misplaced);
     void give_up_map();
     void unknown_header(const attr_text &text, const fatal_exit &failure);
+    bool take_joined_header(std::string_view name, finding &error);
     std::optional<std::string> stripped_header(finding &found, std::string_view name);
     void lose_stanza();
 
@@ -79,9 +81,10 @@ private:
     std::string_view name_given() const;
     std::optional<int> type_meant() const;
     bool follows(const fatal_exit &failure);
+    bool is_foreign_value(const fatal_exit &failure) const;
+    bool is_foreign_property(const fatal_exit &failure) const;
     bool is_misplaced(const fatal_exit &failure);
-    bool blames_element(const fatal_exit &failure) const;
-    void report_element_without_index(const fatal_exit &failure);
+    bool is_other_index() const;
     void recover_index(bool follows);
     void recover_value(const fatal_exit &failure, bool follows);
     void report_type_here();
@@ -101,6 +104,7 @@ private:
     bool strip_returns = false;
     bool index_lost = false; /* the next index of the run is not known */
     int other_index = -1;    /* after a wrong index: another one that may be right as well; -1: none */
+    int awaited_index = -1;  /* after a wrong index: the one that was expected instead, which may follow; -1: none */
 };
 
 } // namespace check

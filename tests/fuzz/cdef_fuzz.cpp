@@ -308,7 +308,7 @@ std::string told(const std::string &text) {
 /* The line in which the compiler met an error: a note has it if the error is reported where its cause is. */
 json line_of(const json &error) {
     for (const json &note : error.at("notes"))
-        if (note.at("message").get<std::string>().starts_with("the compiler refuses this index"))
+        if (note.at("message").get<std::string>().starts_with("the compiler stops here"))
             return note.at("line");
     return error.at("line");
 }

@@ -2,8 +2,8 @@
 
 A source has no error exactly when cdgen compiles it, and the first error is
 the one that cdgen prints: the same text and, where cdgen tells one, the same
-line.  Of an error that is reported at the element that causes it, a note has
-cdgen's line.  The sources are the golden cases; golden cases and examples with a few
+line.  Of an error that is reported where its cause is, a note has cdgen's
+line.  The sources are the golden cases; golden cases and examples with a few
 changes; and those of generate_sources.py, as they are and with its mutations.
 
 The made ones come in groups, each of which is a test of its own.  Everything
@@ -138,7 +138,7 @@ def same(expected, errors):
     if expected is None or not errors:
         return expected is None and not errors
     message = plain(errors[0]["message"])
-    lines = [note["line"] for note in errors[0]["notes"] if note["message"].startswith("the compiler refuses this index")]
+    lines = [note["line"] for note in errors[0]["notes"] if note["message"].startswith("the compiler stops here")]
     line = lines[0] if lines else errors[0]["line"]
     return plain(expected) in (f"{line}: {message}", message)
 

@@ -50,7 +50,7 @@ class Logs(unittest.TestCase):
             self.assertNotIn("region", result["locations"][0]["physicalLocation"])
 
     def test_without_a_column(self):
-        region = self.sarif("keys.cdefsrc")[0]["locations"][0]["physicalLocation"]["region"]
+        region = self.sarif("keys.cdefsrc")[1]["locations"][0]["physicalLocation"]["region"]
         self.assertEqual(region, {"startLine": 13})
 
     def test_all_cases(self):

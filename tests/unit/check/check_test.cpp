@@ -6,6 +6,7 @@ namespace {
 
 using found_in::CLASS;
 using found_in::codes;
+using found_in::element;
 using found_in::findings_in;
 using found_in::found_in;
 using found_in::persistent;
@@ -79,7 +80,7 @@ TEST(Recovery, ReportsAWrongIndexAtTheElementsThatHaveNone) {
     EXPECT_EQ(found[0].notes[0].at.line, 22);
     EXPECT_EQ(found[0].notes[1].at.line, 27);
     EXPECT_EQ(found[0].notes[2].at.line, 36);
-    EXPECT_EQ(found[0].notes[2].text, "the compiler refuses this index: it expects 1");
+    EXPECT_EQ(found[0].notes[2].text, "the compiler stops here: expected is 1");
 }
 
 TEST(Recovery, ReportsAWrongIndexInItsLineIfElementsWithoutOneDoNotExplainIt) {
@@ -122,8 +123,49 @@ TEST(Recovery, ShowsAValueOfALineThatWasTakenAgain) {
     source.replace(source.find("\tFirstKey=1"), 11, "FirstKey=9");
     std::vector<check::finding> found = findings_in(source);
     ASSERT_EQ(found.size(), 2u);
-    EXPECT_EQ(found_in::shown(found[1]), "S304 15");
+    EXPECT_EQ(found_in::shown(found[1]), "S304 15"); /* not where FirstKey is: an error in its line comes first */
     EXPECT_EQ(found[1].notes.at(0).at.column, 10u);
+}
+
+TEST(Recovery, ReportsAnErrorWhereItsCauseIs) {
+    std::string source = CLASS;
+    source.replace(source.find("\tFirstKey=1"), 11, "\tFirstKey=9");
+    EXPECT_EQ(found_in(source), codes{"S304 12:11+1"});
+    std::vector<check::finding> found = findings_in(source);
+    EXPECT_EQ(found.at(0).source, "\tFirstKey=9");
+    EXPECT_EQ(found.at(0).notes.back().text, "the compiler stops here");
+    EXPECT_EQ(found.at(0).notes.back().at.line, 15);
+    source = CLASS;
+    source.replace(source.find("\tResourceManager=M\n"), 19, "");
+    EXPECT_EQ(found_in(source), codes{"S303 10:1+21"});
+    std::string structure = CLASS + persistent("A", "0", "SD") + element("PAttrSDDefinition", "Int23");
+    EXPECT_EQ(found_in(structure + persistent("B", "1", "Int32")), codes{"S215 28:11+5"});
+    EXPECT_EQ(found_in(CLASS + element("DefineSDDefinition", "Int23") + "\tValidValue=1\n"), codes{"S207 21:11+5"});
+}
+
+TEST(Recovery, TakesElementsInAnyOrderForOneMistake) {
+    std::string elements;
+    for (const char *index : {"0", "2", "1", "3"})
+        elements += element("DefineSDDefinition", "Int32", index);
+    std::vector<check::finding> found = findings_in(CLASS + elements);
+    std::erase_if(found, [](const check::finding &each) { return !each.error; });
+    ASSERT_EQ(found.size(), 1u);
+    EXPECT_EQ(found_in::shown(found[0]), "S210 26:15+1");
+}
+
+TEST(Recovery, ReportsALineInTheWrongStanzaOnce) {
+    std::string without = persistent("A", "0", "Int32");
+    without.erase(without.find("\tDescription"), 15);
+    EXPECT_EQ(found_in(CLASS + without + "\tGroupID=1\n" + persistent("B", "1", "Int32", "\tDescription=3\n")),
+              codes{"S108 22:2+7"});
+    EXPECT_EQ(found_in(CLASS + persistent("B", "1", "Int32", "\tDescription=3\n") + without), codes{"S109 23:2+11"});
+    EXPECT_EQ(found_in(CLASS + persistent("B", "1", "Int32", "\tId=3\n") + without), (codes{"S109 23:2+2", "S111 29"}));
+}
+
+TEST(Recovery, TakesAHeaderWithAnAttributeInItsLine) {
+    std::string joined = persistent("A", "0", "Int32");
+    joined.replace(joined.find("\n\t"), 2, " ");
+    EXPECT_EQ(found_in(CLASS + joined), codes{"S101 16:1+34"});
 }
 
 } // namespace

@@ -1,0 +1,106 @@
+"""Plants mistakes in sources that are right, and measures how "cdef check" reports them.
+
+A mistake is found if a finding that the sound source does not have is at a line
+where a report of the mistake is right: its own line, not that of a note.  Every
+error but one is an error that follows from the mistake.  At least 99 of 100
+mistakes are found, with fewer than one error in 100 that follows.
+
+Option --cases of pytest says how many mistakes; --keep is a directory for the
+sources of those that are not found or are followed by errors.
+"""
+
+import collections
+import json
+import random
+import subprocess
+
+import pytest
+
+import generate_sources
+import plant_mistakes
+from programs import EXAMPLES, PROGRAMS
+
+COUNT = 2400
+SANITIZED_COUNT = 1600
+GROUPS = 4
+BATCH = 100
+FOUND = 0.99
+FOLLOWING = 0.01
+
+
+def sound_source(number):
+    """A source that is right: every fourth is one of the examples."""
+    examples = sorted(EXAMPLES.glob("*.cdefsrc"))
+    if number % 4 == 0:
+        return examples[number // 4 % len(examples)].read_text()
+    return generate_sources.source(number)[0].decode("latin-1")
+
+
+def planted(count, first):
+    """So many mistakes, kind after kind: (kind, sound source, source with the mistake, lines)."""
+    number = first * 1000003
+    for at in range(count):
+        kind = plant_mistakes.KINDS[at % len(plant_mistakes.KINDS)]
+        made = None
+        while made is None:
+            number += 1
+            sound = sound_source(number)
+            made = plant_mistakes.plant(random.Random(number), sound, kind)
+        yield kind, sound, *made
+
+
+def findings(sources, directory):
+    """What is found in each of the sources."""
+    paths = [directory / f"{number}.cdefsrc" for number in range(len(sources))]
+    for path, source in zip(paths, sources):
+        path.write_bytes(source.encode("latin-1"))
+    result = subprocess.run([PROGRAMS.cdef, "check", "--format", "json", *paths], capture_output=True, timeout=600)
+    return [each["findings"] for each in json.loads(result.stdout)]
+
+
+def added(before, after):
+    """The findings that a source did not have before; lines may have been moved."""
+
+    def known(finding):
+        return finding["code"], finding["message"], finding["source"]
+
+    left = collections.Counter(map(known, before))
+    new = []
+    for finding in after:
+        if left[known(finding)] > 0:
+            left[known(finding)] -= 1
+        else:
+            new.append(finding)
+    return new
+
+
+def measured(group, count, directory):
+    """Of each mistake of a group: its kind, its source, the lines, what was found, and the number of errors that follow."""
+    mistakes = list(planted(count, PROGRAMS.round * GROUPS + group))
+    for start in range(0, len(mistakes), BATCH):
+        batch = mistakes[start:start + BATCH]
+        before = findings([sound for _, sound, _, _ in batch], directory)
+        after = findings([source for _, _, source, _ in batch], directory)
+        for (kind, _, source, lines), one, other in zip(batch, before, after):
+            new = added(one, other)
+            found = any(finding["line"] in lines for finding in new)
+            errors = sum(finding["severity"] == "error" for finding in new)
+            yield kind, source, lines, new, found, max(errors - 1, 0)
+
+
+@pytest.mark.slow(20)
+@pytest.mark.parametrize("group", range(GROUPS))
+def test_planted(group, directory):
+    """At least 99 of 100 mistakes are found, with fewer than one error in 100 that follows."""
+    count = (PROGRAMS.cases or (SANITIZED_COUNT if PROGRAMS.sanitizers else COUNT)) // GROUPS
+    lost, following = collections.Counter(), collections.Counter()
+    for number, (kind, source, lines, new, found, errors) in enumerate(measured(group, count, directory)):
+        lost[kind] += not found
+        following[kind] += errors
+        if PROGRAMS.keep and (errors or not found):
+            shown = [f"{each['code']} {each['line']}" for each in new]
+            name = f"{group}-{number}-{kind}-{'lost' if not found else 'following'}"
+            (PROGRAMS.keep / f"{name}.cdefsrc").write_bytes(source.encode("latin-1"))
+            (PROGRAMS.keep / f"{name}.txt").write_text(f"{lines}\n{shown}\n")
+    assert lost.total() <= count * (1 - FOUND), f"of {count} mistakes not found: {+lost}"
+    assert following.total() < count * FOLLOWING, f"errors that follow {count} mistakes: {+following}"

@@ -42,8 +42,9 @@ int &first_lines::line_of(std::string_view text, unsigned tag) {
     return entries[found.position - 1].line;
 }
 
-bool first_lines::has(std::string_view text) const {
-    return !slots.empty() && slots[slot_of(text, tag_of(text))].position != 0;
+int first_lines::find(std::string_view text, unsigned tag) const {
+    size_t position = slots.empty() ? 0 : slots[slot_of(text, tag)].position;
+    return position == 0 ? 0 : entries[position - 1].line;
 }
 
 std::vector<std::string_view> first_lines::all() const {

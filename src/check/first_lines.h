@@ -20,9 +20,18 @@ public:
     }
     /* A number is its own tag: numbers mostly ascend, and so their slots are close together. */
     int &line_of(vx_uint32_t number) {
-        return line_of({reinterpret_cast<const char *>(&number), sizeof number}, number);
+        return line_of(text_of_number(number), number);
     }
-    bool has(std::string_view text) const;
+    bool has(std::string_view text) const {
+        return find(text) != 0;
+    }
+    /* The line of a text or a number; 0 if it is not known. */
+    int find(std::string_view text) const {
+        return find(text, tag_of(text));
+    }
+    int find(vx_uint32_t number) const {
+        return find(text_of_number(number), number);
+    }
     /* All texts, in the order in which they came; valid until the next one is added. */
     std::vector<std::string_view> all() const;
     void clear();
@@ -40,7 +49,11 @@ private:
     static unsigned tag_of(std::string_view text) {
         return static_cast<unsigned>(std::hash<std::string_view>()(text) >> 32);
     }
+    static std::string_view text_of_number(const vx_uint32_t &number) {
+        return {reinterpret_cast<const char *>(&number), sizeof number};
+    }
     int &line_of(std::string_view text, unsigned tag);
+    int find(std::string_view text, unsigned tag) const;
     size_t slot_of(std::string_view text, unsigned tag) const;
     void grow();
     std::string_view text_of(size_t position) const {

@@ -1,0 +1,62 @@
+/* value_keys.h: the values of a source as keys that compare as the values do, and sets of ranges of them. */
+#ifndef CDGEN_CHECK_VALUE_KEYS_H
+#define CDGEN_CHECK_VALUE_KEYS_H
+
+#include "vx.h"
+
+#include <compare>
+#include <cstdint>
+#include <map>
+#include <optional>
+#include <string>
+#include <string_view>
+
+namespace check {
+
+/* A value as it is stored. Numbers compare by their value, texts and bytes as strings of bytes do. Only keys of one
+ * type can be compared. */
+struct value_key {
+    auto operator<=>(const value_key &) const = default;
+
+    std::int64_t number = 0; /* ascends with the value */
+    std::string text;        /* empty for numbers */
+};
+
+/* The key of a text that the compiler has accepted as a value of a type, or of an element of an array type. Nothing for
+ * NaN, which is neither above nor below a value, for a Binary of which bytes are lost, and for types without texts. */
+std::optional<value_key> key_of(vx_data_type_t type, std::string_view text);
+
+/* The key of the value that a type has by itself: 0, or nothing at all. */
+std::optional<value_key> default_key(vx_data_type_t type);
+
+/* Ranges that do not overlap; those that would are united. Each takes the line that it was given in. */
+class key_ranges {
+public:
+    struct range {
+        value_key low, high;
+        int line = 0;
+    };
+
+    /* Returns a range given earlier that has a value in common with this one; its line is 0 if none has. Of united
+     * ranges the first one's line is kept. A range from a higher to a lower value has no values. */
+    range add(range given);
+    bool has(const value_key &key) const;
+    bool empty() const {
+        return by_low.empty();
+    }
+    void clear() {
+        by_low.clear();
+    }
+
+private:
+    struct rest {
+        value_key high;
+        int line;
+    };
+
+    std::map<value_key, rest> by_low;
+};
+
+} // namespace check
+
+#endif

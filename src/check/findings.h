@@ -23,6 +23,7 @@ public:
 
     /* The finding is to be completed with notes before the next one is added. */
     finding &error(const message &known, const place &at, std::string_view source, std::string text);
+    /* With a note, if it has a text. */
     finding &warn(const warning &known, const place &at, std::string_view source, std::string text, note more);
     /* Takes back the warnings of a line, which an error now explains. */
     void retract(warning_id id, int line);

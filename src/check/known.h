@@ -67,6 +67,10 @@ struct stanza_record {
     bool is_empty() const {
         return std::all_of(given.begin(), given.end(), [](int line) { return line == 0; });
     }
+    /* Whether a line of it that was refused, or is not its own, may have been meant as an attribute of these types. */
+    bool may_have_lost(std::initializer_list<attr_type> wanted) const {
+        return misplaced || refused.unknown_name || refused.has_any(wanted);
+    }
 
     place header;
     std::string source; /* the header's line */

@@ -4,6 +4,7 @@
 
 #include "check/lacking.h"
 #include "check/notes.h"
+#include "check/numbers.h"
 
 #include <algorithm>
 #include <utility>
@@ -186,11 +187,52 @@ void recovery::note_refused(const std::optional<int> &attr_type) {
     known.stanza().refused.add(attr_type);
 }
 
+/* In place, since this is done for each attribute and element. */
+void recovery::note_value() {
+    known.declared.earlier_name = known.declared.earlier_id = 0;
+    int type = see.attr().ta_type;
+    if (type == AT_STRING || type == AT_SD_NAME || type == AT_ID)
+        return declare();
+    if (type != AT_DATA_TYPE && type != AT_SD_DATA_TYPE)
+        return;
+    mention &given = known.stanza().data_type;
+    given.at = see.value_place();
+    given.text = see.value();
+    given.source = line.raw;
+    bool odd = compiler.data_type() == VX_UNKNOWN || given.text == "SBS";
+    if (type == AT_SD_DATA_TYPE && odd && compiler.run_makes_value())
+        known.run.odd_types.push_back(given);
+}
+
+/* Text that is not a number is no Id: it has a warning of its own. */
+void recovery::declare() {
+    std::string_view attr = see.attr().ta_name;
+    int *line_of_first = nullptr;
+    int *earlier = nullptr;
+    if (see.attr().ta_type == AT_ID) {
+        number n(see.value(), 0);
+        if (n.read == 0)
+            return;
+        line_of_first = &known.declared.ids[index_of(known.kind)].line_of(static_cast<vx_uint32_t>(n.value));
+        earlier = &known.declared.earlier_id;
+    } else if ((attr == "Name" || attr == "ElementName") && known.kind != SC_RESOURCE_CLASS) {
+        line_of_first = &known.declared.names[index_of(known.kind)].line_of(see.value());
+        earlier = &known.declared.earlier_name;
+    } else {
+        return;
+    }
+    *earlier = *line_of_first;
+    if (*line_of_first == 0)
+        *line_of_first = line.number;
+}
+
 /* Takes a text instead of the current line's, of which an error has been reported. */
 void recovery::take_quietly(std::string_view text, size_t added) {
     try {
         compiler.take_attribute(line.replaced(text, added));
         note_given();
+        if (compiler.latest().attr != nullptr && !known.stanza().misplaced)
+            note_value();
     } catch (const fatal_exit &) {
         const table_attrs *attr = compiler.latest().attr;
         note_refused(attr == nullptr ? std::nullopt : std::optional(attr->ta_type));

@@ -55,6 +55,8 @@ private:
     /* Attributes that have been taken (recovery.cpp). */
     void note_given();
     void note_refused(const std::optional<int> &attr_type);
+    void note_value();
+    void declare();
     void take_quietly(std::string_view text, size_t added);
 
     /* Headers (recover_header.cpp). */
@@ -73,8 +75,6 @@ private:
     /* Attribute lines (recover_attribute.cpp). */
     void recover_attribute(const fatal_exit &failure);
     void settle_split();
-    void note_value();
-    void declare();
     std::string_view header_meant(const fatal_exit &failure) const;
     void indented_header(std::string_view meant, const fatal_exit &failure);
     void lose_first_header(const fatal_exit &failure);

@@ -7,6 +7,7 @@
 #include "check/findings.h"
 #include "check/known.h"
 
+#include <algorithm>
 #include <string>
 #include <string_view>
 
@@ -29,6 +30,13 @@ struct view {
     }
     std::string_view value() const {
         return line.at(value_place());
+    }
+    /* What comes after the value if that is a comment without a blank in front, which may be meant as text. */
+    std::string_view comment_at_value() const {
+        place value = value_place();
+        std::string_view rest = line.raw.substr(std::min(value.column - 1 + value.length, line.raw.size()));
+        bool comment = rest.starts_with('#') || rest.starts_with("//") || rest.starts_with("/*");
+        return comment ? rest.substr(0, rest.find_last_not_of(" \t\r") + 1) : std::string_view();
     }
     mention value_mention() const {
         return {value_place(), std::string(value()), std::string(line.raw)};

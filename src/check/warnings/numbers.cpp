@@ -4,8 +4,13 @@
 
 #include "check/warnings/watcher.h"
 
+#include <algorithm>
+#include <array>
 #include <cstdlib>
+#include <optional>
 #include <string>
+#include <string_view>
+#include <vector>
 
 namespace check {
 
@@ -26,7 +31,7 @@ public:
 
     void number(const view &see, const number_part &part) override {
         if (part.form == number_form::VERSION_REST)
-            return report(see, place_of(see, part), "a version has four parts: these are cut off");
+            return void(report(see, place_of(see, part), "a version has four parts: these are cut off"));
         if (part.form != number_form::VERSION_PART && bits_of(part.form) == 0)
             return;
         check::number n(part.text, part.form == number_form::VERSION_PART ? 10 : 0);
@@ -38,9 +43,76 @@ public:
     }
 };
 
+/* The Ids of attributes, as far as they do not fit the class's Locator, which is looked up at the end. */
+class wide_ids {
+public:
+    struct entry {
+        std::string name; /* of the attribute */
+        mention id;
+        long value = 0;
+    };
+
+    void begin_class() {
+        all.clear();
+    }
+    void take_name(std::string_view text) {
+        current.name = text;
+    }
+    void take_id(const view &see) {
+        constexpr long HIGHEST = 0xFFFE; /* the next one means that there is no locator */
+        current.value = check::number(see.value(), 0).value;
+        if (current.value > HIGHEST)
+            current.id = see.value_mention();
+    }
+    void end_attribute() {
+        if (current.id.at.line != 0)
+            all.push_back(current);
+        current = {};
+    }
+    const entry *of(std::string_view name) const {
+        auto found = std::find_if(all.begin(), all.end(), [&](const entry &each) { return each.name == name; });
+        return found == all.end() ? nullptr : &*found;
+    }
+
+private:
+    entry current;
+    std::vector<entry> all;
+};
+
 class narrowed : public watcher {
 public:
     using watcher::watcher;
+    static constexpr std::array types = {AT_LOCATOR, AT_STRING, AT_ID};
+
+    void value(const view &see) override {
+        if (see.attr().ta_type == AT_LOCATOR)
+            locator = see.value_mention();
+        if (see.known.kind != SC_PERSISTENT_RESOURCE_ATTRIBUTE)
+            return;
+        if (see.attr().ta_type == AT_ID)
+            ids.take_id(see);
+        else
+            ids.take_name(see.value());
+    }
+    void before_step(const view &see, int next_kind) override {
+        if (next_kind == SC_CONTROL_DEFINITION && see.compiler.class_is_open())
+            ids.begin_class();
+    }
+    void stanza_end(const view &see, int) override {
+        if (see.known.kind == SC_PERSISTENT_RESOURCE_ATTRIBUTE)
+            ids.end_attribute();
+    }
+    void source_end(const view &) override {
+        constexpr long BITS = 0xFFFF;
+        const wide_ids::entry *wide = locator ? ids.of(locator->text) : nullptr;
+        if (wide == nullptr)
+            return;
+        advise(report(wide->id.at, wide->id.source,
+                      "does not fit the 16 bits that the Locator has: it is stored as " +
+                          ((wide->value & BITS) == BITS ? "65535, none" : std::to_string(wide->value & BITS)),
+                      {locator->at, "the `Locator`"}),
+               "choose an Id of at most 65534");
+    }
 
     void number(const view &see, const number_part &part) override {
         switch (part.form) {
@@ -104,6 +176,9 @@ private:
         if (n.overflow || n.value < 0 || n.value > 255)
             report(see, place_of(see, part), "a part of a version has 8 bits");
     }
+
+    std::optional<mention> locator;
+    wide_ids ids;
 };
 
 class octal : public watcher {

@@ -1,8 +1,9 @@
-/* partners.cpp: warnings about attributes of a stanza that need, or bound, another one. */
+/* partners.cpp: warnings about attributes of a stanza that need, bound or exclude another one. */
 
 #include "check/numbers.h"
 #include "check/warnings/watcher.h"
 
+#include <map>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -18,10 +19,8 @@ vx_uint16_t number_in(const view &see) {
     return static_cast<vx_uint16_t>(number(see.value(), 0).value);
 }
 
-bool is_broken(const view &see) {
-    return see.known.kind < 0 || see.compiler.is_broken(see.known.kind);
-}
-
+/* What needs an Expression, or a ReArmDescription, which needs a ReArmExpression. A refused line may be the other one.
+ */
 class no_expression : public watcher {
 public:
     using watcher::watcher;
@@ -29,24 +28,39 @@ public:
 
     void value(const view &see) override {
         std::string_view name = see.attr().ta_name;
-        if (name == "Expression")
+        if (name == EXPRESSION)
             has_expression = true;
-        else if (name == "ReArmExpression" || name == "ExpressionDescription")
+        if (name == REARM)
+            has_rearm = true;
+        if (name == REARM || name == "ExpressionDescription" || name == "ReArmDescription")
             dependents.push_back({see.name_place(), std::string(name), std::string(see.line.raw)});
     }
     void stanza_end(const view &see, int) override {
-        if (!has_expression && !is_broken(see))
+        if (!dependents.empty() && !see.known.stanza().may_have_lost({AT_STRING}))
             for (const mention &each : dependents)
-                report(each.at, each.source, language::quoted(each.text) + " without `Expression`");
-        has_expression = false;
+                look_at(each);
+        has_expression = has_rearm = false;
         dependents.clear();
     }
 
 private:
+    static constexpr std::string_view EXPRESSION = "Expression", REARM = "ReArmExpression";
+
+    void look_at(const mention &dependent) {
+        bool needs_rearm = dependent.text == "ReArmDescription";
+        if (needs_rearm ? has_rearm : has_expression)
+            return;
+        std::string partner = language::quoted(needs_rearm ? REARM : EXPRESSION);
+        advise(report(dependent.at, dependent.source, language::quoted(dependent.text) + " without " + partner),
+               "add the " + partner + ", or remove this line");
+    }
+
     bool has_expression = false;
+    bool has_rearm = false;
     std::vector<mention> dependents;
 };
 
+/* Groups are those of a class. */
 class group : public watcher {
 public:
     using watcher::watcher;
@@ -55,24 +69,54 @@ public:
     void value(const view &see) override {
         constexpr vx_uint16_t NO_GROUP = 255;
         std::string_view name = see.attr().ta_name;
-        if (name == "GroupName")
-            group_name = mention{see.name_place(), {}, std::string(see.line.raw)};
+        if (name == "GroupName") {
+            group_name = number_in(see);
+            name_line = {see.name_place(), std::string(see.value()), std::string(see.line.raw)};
+        }
         if (name != "GroupID")
             return;
-        has_id = true;
-        if (number_in(see) == NO_GROUP)
-            report(see, see.value_place(), "the number 255 means no group");
+        group_id = number_in(see);
+        if (group_id == NO_GROUP)
+            advise(report(see, see.value_place(), "the number 255 means no group"), "give the group another number");
     }
     void stanza_end(const view &see, int) override {
-        if (group_name && !has_id && !is_broken(see))
-            report(group_name->at, group_name->source, "`GroupName` without `GroupID`: the attribute is in no group");
+        if (group_name && group_id)
+            look_at_name();
+        else if (group_name && !see.known.stanza().may_have_lost({AT_UINT16}))
+            advise(
+                report(name_line.at, name_line.source, "`GroupName` without `GroupID`: the attribute is in no group"),
+                "add a `GroupID`, or remove this line");
+        group_id.reset();
         group_name.reset();
-        has_id = false;
+    }
+    void before_step(const view &, int next_kind) override {
+        if (next_kind == SC_CONTROL_DEFINITION)
+            groups.clear();
     }
 
 private:
-    std::optional<mention> group_name;
-    bool has_id = false;
+    struct naming {
+        vx_uint16_t name;
+        int line;
+    };
+
+    /* A group without a name has the one that another attribute gives it. */
+    void look_at_name() {
+        if (*group_name == 0)
+            return;
+        naming first = groups.try_emplace(*group_id, naming{*group_name, name_line.at.line}).first->second;
+        if (first.name == *group_name)
+            return;
+        finding &about = report(name_line.at, name_line.source,
+                                "group " + std::to_string(*group_id) + " has the `GroupName` " +
+                                    std::to_string(first.name) + " already",
+                                {{first.line, 0, 0}, "given here"});
+        advise(about, "give all attributes of a group the same name");
+    }
+
+    std::optional<vx_uint16_t> group_id, group_name; /* of the stanza */
+    mention name_line;                               /* that of group_name */
+    std::map<vx_uint16_t, naming> groups;            /* of the class */
 };
 
 class intervals : public watcher {
@@ -89,9 +133,10 @@ public:
     }
     void stanza_end(const view &, int) override {
         if (observation && reporting && reporting->first < observation->first)
-            report(reporting->second.at, reporting->second.source,
-                   "the `ReportingInterval` is below the `ObservationInterval`",
-                   {{observation->second.at.line, 0, 0}, "which is given here"});
+            advise(report(reporting->second.at, reporting->second.source,
+                          "the `ReportingInterval` is below the `ObservationInterval`",
+                          {{observation->second.at.line, 0, 0}, "which is given here"}),
+                   "exchange the two numbers");
         observation.reset();
         reporting.reset();
     }
@@ -101,6 +146,37 @@ private:
 
     std::optional<interval> observation;
     std::optional<interval> reporting;
+};
+
+/* In a variable class the compiler sets a bit in the Ids of class attributes. */
+class class_bit : public watcher {
+public:
+    using watcher::watcher;
+    static constexpr std::array types = {AT_ID, AT_STRING};
+
+    void value(const view &see) override {
+        constexpr long CLASS_BIT = 0x8000;
+        if (table_of(see.known.kind).sc_attr == nullptr)
+            return;
+        if (see.attr().ta_type == AT_ID && (check::number(see.value(), 0).value & CLASS_BIT) != 0)
+            id = see.value_mention();
+        else if (std::string_view(see.attr().ta_name) == "VariableClass")
+            in_variable_class = true;
+    }
+    void stanza_end(const view &see, int) override {
+        if (id && in_variable_class)
+            advise(report(id->at, id->source,
+                          see.known.kind == SC_DYNAMIC_CLASS_ATTRIBUTE
+                              ? "bit 0x8000 is set in the variable class anyway: this is the Id without it"
+                              : "with bit 0x8000 this is the Id of a class attribute in the variable class"),
+                   "choose an Id below 32768");
+        id.reset();
+        in_variable_class = false;
+    }
+
+private:
+    std::optional<mention> id; /* one with the bit */
+    bool in_variable_class = false;
 };
 
 } // namespace
@@ -115,6 +191,10 @@ made_watcher make_group(const watcher_setup &setup) {
 
 made_watcher make_intervals(const watcher_setup &setup) {
     return make<intervals>(setup);
+}
+
+made_watcher make_class_bit(const watcher_setup &setup) {
+    return make<class_bit>(setup);
 }
 
 } // namespace check

@@ -2,85 +2,119 @@
 
 #include "check/warnings/watcher.h"
 
+#include <array>
+#include <optional>
 #include <string>
-#include <utility>
-#include <vector>
 
 namespace check {
 
 namespace {
 
-/* The compiler has one mark for the ranges of both kinds of dynamic attributes, and the completion of either kind
- * clears it. */
+constexpr std::array DYNAMIC = {SC_DYNAMIC_RESOURCE_ATTRIBUTE, SC_DYNAMIC_CLASS_ATTRIBUTE};
+
+bool is_dynamic(int kind) {
+    return kind == SC_DYNAMIC_RESOURCE_ATTRIBUTE || kind == SC_DYNAMIC_CLASS_ATTRIBUTE;
+}
+
+/* The compiler has one mark for the ranges of both kinds of dynamic attributes. An attribute that is completed while
+ * the mark is set keeps the bounds that its record has; otherwise it gets the default ones. Its completion clears the
+ * mark. What the next class ends is not completed and keeps its bounds. */
 class range_elsewhere : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_RANGE};
+    static constexpr std::array types = {AT_RANGE, AT_DATA_TYPE};
 
     void value(const view &see) override {
-        if (!is_numeric(see.compiler.data_type()))
+        if (!is_dynamic(see.known.kind) || !is_numeric(see.compiler.data_type()))
             return;
-        if (see.known.kind == SC_DYNAMIC_CLASS_ATTRIBUTE && see.compiler.is_open(SC_DYNAMIC_RESOURCE_ATTRIBUTE))
-            report(see, see.text_place(), "this Range goes to the `DynamicResourceAttribute` that is still open",
-                   begun(see, SC_DYNAMIC_RESOURCE_ATTRIBUTE));
+        if (see.attr().ta_type == AT_DATA_TYPE)
+            of(see.known.kind).numeric = true;
         else
-            ranges.push_back({see.text_place(), see.known.kind, std::string(see.line.raw)});
+            take_range(see);
     }
 
-    void before_step(const view &see, int) override {
-        resource_was_open = see.compiler.is_open(SC_DYNAMIC_RESOURCE_ATTRIBUTE);
-        class_was_open = see.compiler.is_open(SC_DYNAMIC_CLASS_ATTRIBUTE);
+    void before_step(const view &see, int next_kind) override {
+        for (int kind : DYNAMIC)
+            of(kind).was_open = see.compiler.is_open(kind);
+        if (next_kind == SC_CONTROL_DEFINITION)
+            latest = {};
     }
 
     void after_step(const view &see, int next_kind) override {
-        if (next_kind == SC_CONTROL_DEFINITION) /* nothing is completed: the ranges stay */
-            return ranges.clear();
-        if (resource_was_open && is_completed(see, SC_DYNAMIC_RESOURCE_ATTRIBUTE, next_kind))
-            complete(see, SC_DYNAMIC_RESOURCE_ATTRIBUTE);
-        if (class_was_open && is_completed(see, SC_DYNAMIC_CLASS_ATTRIBUTE, next_kind))
-            complete(see, SC_DYNAMIC_CLASS_ATTRIBUTE);
+        for (int kind : DYNAMIC)
+            if (of(kind).was_open && (next_kind == kind || !see.compiler.is_open(kind)))
+                complete(see, kind);
     }
 
     /* An attribute that is not completed does not use its range. */
-    void dropped(const view &see, int kind) override {
-        int header = see.known.stanzas[index_of(kind)].header.line;
-        std::erase_if(ranges, [&](const pending &each) { return each.kind == kind && each.at.line >= header; });
+    void dropped(const view &, int kind) override {
+        if (is_dynamic(kind))
+            of(kind) = {};
     }
 
 private:
-    /* A Range whose attribute has not been completed. */
-    struct pending {
+    struct range {
         place at;
+        std::string source; /* the line */
+    };
+    /* Another attribute, which was completed while the mark was that of a range. */
+    struct completed {
         int kind;
-        std::string source;    /* the line */
-        place cleared_by = {}; /* the header of the attribute whose completion cleared the mark, if one did */
+        place begin;
+        bool without_range;
+    };
+    /* The latest attribute of a kind. */
+    struct attribute {
+        bool was_open = false; /* when the current step began */
+        bool numeric = false;
+        std::optional<range> given;
+        std::optional<completed> first; /* cleared the mark of the range */
     };
 
-    /* A record of a kind has been completed: with its range, unless the other kind has cleared the mark. */
+    attribute &of(int kind) {
+        return latest[kind == SC_DYNAMIC_CLASS_ATTRIBUTE];
+    }
+
+    void take_range(const view &see) {
+        marked = true;
+        if (see.known.kind == SC_DYNAMIC_CLASS_ATTRIBUTE && see.compiler.is_open(SC_DYNAMIC_RESOURCE_ATTRIBUTE)) {
+            of(SC_DYNAMIC_RESOURCE_ATTRIBUTE).given.reset(); /* replaced, which this warning says */
+            advise(report(see, see.text_place(), "this Range goes to the `DynamicResourceAttribute` that is still open",
+                          {see.known.stanzas[SC_DYNAMIC_RESOURCE_ATTRIBUTE].header, "begun here"}),
+                   "put dynamic class attributes in front of those of resources");
+        } else {
+            of(see.known.kind).given = range{see.text_place(), std::string(see.line.raw)};
+        }
+    }
+
     void complete(const view &see, int kind) {
+        attribute &other =
+            of(kind == SC_DYNAMIC_CLASS_ATTRIBUTE ? SC_DYNAMIC_RESOURCE_ATTRIBUTE : SC_DYNAMIC_CLASS_ATTRIBUTE);
+        attribute &mine = of(kind);
+        if (other.given && marked && !other.first)
+            other.first = completed{kind, see.known.stanzas[index_of(kind)].header, mine.numeric && !mine.given};
+        end(see, kind, marked);
+        marked = false;
+    }
+
+    /* An attribute keeps the bounds of its record, or gets the default ones. */
+    void end(const view &see, int kind, bool keeps) {
+        const attribute &mine = of(kind);
         const lost_stanzas &lost = see.known.lost;
-        bool uncertain = lost.may_be(SC_DYNAMIC_RESOURCE_ATTRIBUTE) || lost.may_be(SC_DYNAMIC_CLASS_ATTRIBUTE);
-        int other = kind == SC_DYNAMIC_CLASS_ATTRIBUTE ? SC_DYNAMIC_RESOURCE_ATTRIBUTE : SC_DYNAMIC_CLASS_ATTRIBUTE;
-        for (pending &range : ranges)
-            if (range.kind == other && range.cleared_by.line == 0)
-                range.cleared_by = see.known.stanzas[index_of(kind)].header;
-            else if (range.kind == kind && range.cleared_by.line != 0 && !uncertain)
-                report(range.at, range.source,
-                       "this Range is lost: a " + language::quoted(table_of(other).sc_name) + " is completed first",
-                       {range.cleared_by, "begun here"});
-        std::erase_if(ranges, [&](const pending &range) { return range.kind == kind; });
+        bool certain = !lost.may_be(SC_DYNAMIC_RESOURCE_ATTRIBUTE) && !lost.may_be(SC_DYNAMIC_CLASS_ATTRIBUTE);
+        if (mine.given && mine.first && certain && (!keeps || mine.first->without_range)) {
+            std::string name = language::quoted(table_of(mine.first->kind).sc_name);
+            advise(report(mine.given->at, mine.given->source,
+                          keeps ? "because of this Range, a " + name + " that is completed first has the range 0 to 0"
+                                : "this Range is lost: a " + name + " is completed first",
+                          {mine.first->begin, "begun here"}),
+                   "put dynamic class attributes in front of those of resources, one without a Range last");
+        }
+        of(kind) = {};
     }
 
-    static note begun(const view &see, int kind) {
-        return {see.known.stanzas[index_of(kind)].header, "begun here"};
-    }
-    static bool is_completed(const view &see, int kind, int next_kind) {
-        return next_kind == kind || !see.compiler.is_open(kind);
-    }
-
-    std::vector<pending> ranges;
-    bool resource_was_open = false;
-    bool class_was_open = false;
+    std::array<attribute, DYNAMIC.size()> latest;
+    bool marked = false;
 };
 
 } // namespace

@@ -13,12 +13,13 @@
 namespace check {
 
 /* To add a warning: a class in a file of this folder, its maker, a row, and its id. */
-maker make_carriage_return, make_comma_list, make_comment_in_value, make_cut_short, make_element_type, make_group,
-    make_ignored_range, make_incomplete, make_intervals, make_long_line, make_lost_bytes, make_low_above_high,
-    make_narrowed, make_no_expression, make_no_resource_class, make_number_text, make_octal, make_overridden,
-    make_permission, make_properties, make_range_elsewhere, make_same_id, make_same_name, make_sd_run_at_end,
-    make_sd_without_run, make_second_resource_class, make_stray_run, make_text_after_quote, make_unknown_locator,
-    make_unknown_variable_class, make_unused_default, make_unused_variable_class;
+maker make_carriage_return, make_class_bit, make_comma_list, make_comment_in_value, make_cut_short, make_element_type,
+    make_group, make_ignored_range, make_incomplete, make_intervals, make_invalid_default, make_long_line,
+    make_lost_bytes, make_low_above_high, make_narrowed, make_no_expression, make_no_resource_class, make_number_text,
+    make_octal, make_outer_blank, make_overlap, make_overridden, make_permission, make_properties, make_range_elsewhere,
+    make_same_id, make_same_name, make_sd_run_at_end, make_sd_without_run, make_second_resource_class, make_stray_run,
+    make_text_after_quote, make_unbalanced, make_unknown_locator, make_unknown_variable_class, make_unused_default,
+    make_unused_variable_class;
 
 namespace {
 
@@ -50,7 +51,8 @@ constexpr row rows[] = {
      make_number_text},
     {{NARROWED, "S508", "narrowed", "a number does not fit and is cut",
       "A number does not fit its field, so only its low bits are stored. Or a run has more than 65536 "
-      "elements, so that the highest index does not fit 16 bits.",
+      "elements, so that the highest index does not fit 16 bits. Or the `Id` of the attribute that a `Locator` "
+      "names is above 65534, the highest that a class can store for it.",
       "Use a smaller number, or a wider type."},
      make_narrowed},
     {{OCTAL, "S509", "octal", "a leading 0 makes a number octal",
@@ -60,18 +62,25 @@ constexpr row rows[] = {
     {{LOW_ABOVE_HIGH, "S519", "low-above-high", "the lower bound is above the upper one",
       "A lower bound is greater than the upper one.", "Exchange them."},
      make_low_above_high},
-    {{SAME_ID, "S507", "same-id", "two of one kind have the same Id",
-      "Two attributes or actions of one kind have the same `Id`. Text that is not a number (S510) does "
-      "not count.",
+    {{OVERLAP, "S535", "overlap", "values or varieties are given twice",
+      "A `ValidValue`, `ValidStateValue` or `VarietyRange` repeats an earlier one of its stanza, or overlaps with it. "
+      "Texts are compared byte by byte.",
+      "Give each value once."},
+     make_overlap},
+    {{SAME_ID, "S507", "same-id", "two attributes or actions have the same Id",
+      "Two attributes or actions of one kind have the same `Id`, or a persistent and a dynamic attribute of a "
+      "resource, or of the class. Text that is not a number (S510) does not count.",
       "Give one of them another number."},
      make_same_id},
-    {{SAME_NAME, "S506", "same-name", "two of one kind have the same name",
-      "Two attributes, actions or elements of one kind, or two variable classes, have the same name.", "Rename one."},
+    {{SAME_NAME, "S506", "same-name", "two names are the same, but for case",
+      "Two attributes, actions or elements of one kind, or two variable classes, have the same name, or names that "
+      "differ only in case. Or a persistent and a dynamic attribute of a resource, or of the class, have.",
+      "Rename one."},
      make_same_name},
     {{RANGE_ELSEWHERE, "S503", "range-elsewhere", "a Range does not reach its attribute",
       "A `Range` of a `DynamicClassAttribute` is stored in a `DynamicResourceAttribute` that is still "
       "open. Or another dynamic attribute is completed first, which clears the mark that a `Range` was "
-      "given.",
+      "given. If that one has no `Range` itself, it has the range 0 to 0 instead of 0 to 100.",
       "Put dynamic class attributes first, and one without a `Range` last among them. After an attribute "
       "with a `Range`, put another of its kind."},
      make_range_elsewhere},
@@ -113,8 +122,8 @@ constexpr row rows[] = {
      make_overridden},
     {{COMMA_LIST, "S526", "comma-list", "a list with commas is not a list",
       "A `ValidValue` or `ValidStateValue` of texts has more than one comma: it is a range, from what "
-      "comes before the first comma to all that comes after it. Or an element of a `StringArray` has "
-      "commas and no quotes: a line is one element.",
+      "comes before the first comma to all that comes after it. Or an element of a `StringArray` or `BinaryArray` "
+      "has commas and no quotes: a line is one element.",
       "Write one line for each value or element. Put an element with commas in quotes."},
      make_comma_list},
     {{IGNORED_RANGE, "S527", "ignored-range", "a Range of a type that has none",
@@ -122,16 +131,18 @@ constexpr row rows[] = {
       "Remove the line. For strings, use `ValidStateValue`."},
      make_ignored_range},
     {{NO_EXPRESSION, "S528", "no-expression", "what belongs to an Expression is without one",
-      "A dynamic attribute has a `ReArmExpression` or an `ExpressionDescription`, but no `Expression`.",
-      "Add the `Expression`, or remove the line."},
+      "A dynamic attribute has a `ReArmExpression` or an `ExpressionDescription`, but no `Expression`. Or it has a "
+      "`ReArmDescription`, but no `ReArmExpression`.",
+      "Add the expression, or remove the line."},
      make_no_expression},
-    {{GROUP, "S529", "group", "an attribute has the name of a group, but no group",
-      "An attribute has a `GroupName` but no `GroupID`, or its `GroupID` is 255, which means no group.",
-      "Give the group another number."},
+    {{GROUP, "S529", "group", "a group has no number, or two names",
+      "An attribute has a `GroupName` but no `GroupID`, or its `GroupID` is 255, which means no group. Or two "
+      "attributes of a class have the same `GroupID` and different `GroupName`s.",
+      "Give the attribute a `GroupID` other than 255, and all attributes of a group the same `GroupName`."},
      make_group},
     {{UNUSED_VARIABLE_CLASS, "S530", "unused-variable-class", "a variable class is never used",
       "No dynamic attribute names a `ResourceVariableClass` as its `VariableClass`. Not reported while a "
-      "`VariableClass` has an unknown name (S505).",
+      "`VariableClass` has an unknown name (S505), or a line of a dynamic attribute was not understood.",
       "Remove it, or give attributes its name."},
      make_unused_variable_class},
     {{INTERVALS, "S531", "intervals", "a variable class is reported more often than observed",
@@ -142,6 +153,28 @@ constexpr row rows[] = {
       "and `InvalForDefine`, or `ReqdForDefine` and `ReadOnly`.",
       "Remove one of them."},
      make_properties},
+    {{INVALID_DEFAULT, "S533", "invalid-default", "a default is not valid itself",
+      "A `DefaultValue` or `InitialValue` is not among the valid values of its attribute, or is outside its `Range`. "
+      "Without such a line, that is said of the default of the type: 0 or an empty text, or one such element of an "
+      "array. It is not said of an attribute with `ReqdForDefine`, which needs no default. Elements of structured "
+      "data have no defaults of their own.",
+      "Choose a default that is allowed, or allow it."},
+     make_invalid_default},
+    {{CLASS_BIT, "S534", "class-bit", "an Id has the bit of class attributes",
+      "The `Id` of a dynamic attribute in a variable class has bit 0x8000, which is added there to the Ids of class "
+      "attributes to tell them from those of resources.",
+      "Choose an `Id` below 32768."},
+     make_class_bit},
+    {{OUTER_BLANK, "S536", "outer-blank", "a text begins or ends with a blank",
+      "A name begins or ends with a blank. Or a value of type `String` begins with one and is not quoted, as in "
+      "`DefaultValue= x`. The blank is stored.",
+      "Remove it. Quote a value that has to begin with a blank."},
+     make_outer_blank},
+    {{UNBALANCED, "S537", "unbalanced", "an expression lacks a parenthesis or a quote",
+      "An `Expression` or `ReArmExpression` has a parenthesis or a quote without its partner. Characters after a "
+      "backslash do not count.",
+      "Add the other one, or remove this one."},
+     make_unbalanced},
     {{INCOMPLETE, "S515", "incomplete", "a stanza lacks required attributes",
       "A stanza lacks required attributes, which the compiler does not notice: their fields are 0.", "Add them."},
      make_incomplete},
@@ -154,22 +187,27 @@ constexpr row rows[] = {
       "them, so it has no value and no highest index.",
       "Put another stanza after them, for example by moving the elements up."},
      make_sd_run_at_end},
-    {{STRAY_RUN, "S518", "stray-run", "an action's elements have no action",
-      "`ActionInSDDefinition` or `ActionOutSDDefinition` comes where no action is open. Not reported if "
-      "an error shows that the action's header is missing.",
-      "Put it after its action."},
+    {{STRAY_RUN, "S518", "stray-run", "elements do not belong to what they follow",
+      "`ActionInSDDefinition` or `ActionOutSDDefinition` comes where no action is open. `PAttrSDDefinition` follows a "
+      "dynamic attribute, or `DAttrSDDefinition` a persistent one. Or elements of another kind directly follow "
+      "those of an attribute, which leaves open whose they are. Not reported if an error shows that a header is "
+      "missing.",
+      "Put elements after what they belong to, and another stanza between two structures."},
      make_stray_run},
     {{CUT_SHORT, "S514", "cut-short", "a second class ends an attribute unchecked",
       "A second `ControlDefinition` ends an open attribute as it is, without checks and defaults.",
       "Put each class in a file of its own."},
      make_cut_short},
     {{UNKNOWN_LOCATOR, "S504", "unknown-locator", "a Locator names no attribute",
-      "A `Locator` names no `PersistentResourceAttribute` of the last class.", "Correct the name."},
+      "A `Locator` names no `PersistentResourceAttribute` of the last class. Not reported if such an attribute may "
+      "have "
+      "the name in a line or a stanza that was not understood.",
+      "Correct the name."},
      make_unknown_locator},
     {{UNKNOWN_VARIABLE_CLASS, "S505", "unknown-variable-class", "a VariableClass names no variable class",
       "A `VariableClass` names no `ResourceVariableClass`, so the attribute belongs to none. Reported "
-      "once for each name, where it is first given, and not while a `ResourceVariableClass` has no name "
-      "itself (S515).",
+      "once for each name, where it is first given, and not while a `ResourceVariableClass` has no name that was "
+      "understood.",
       "Correct the name, or define the variable class."},
      make_unknown_variable_class},
 };

@@ -46,11 +46,12 @@ private:
     void look_at_class(const view &see) {
         if (!parts.control || parts.resource_class.line != 0 || see.known.lost.may_be(SC_RESOURCE_CLASS))
             return;
-        note more;
+        finding &about = report(parts.control->at, parts.control->source,
+                                "the class has no `ResourceClass`: its properties and message numbers are 0");
         if (parts.early.line != 0)
-            more = {parts.early, "`ControlDefinition` clears this one: put it after"};
-        report(parts.control->at, parts.control->source,
-               "the class has no `ResourceClass`: its properties and message numbers are 0", std::move(more));
+            about.notes.push_back({parts.early, "`ControlDefinition` clears this one: put it after"});
+        else
+            advise(about, "add a `ResourceClass` after it");
     }
 
     class_parts parts;
@@ -62,9 +63,11 @@ public:
 
     void before_step(const view &see, int next_kind) override {
         if (next_kind == SC_RESOURCE_CLASS && parts.control && parts.resource_class.line != 0)
-            report(see, see.line.all(),
-                   "the class has a `ResourceClass` already: this one replaces what both give, and adds its properties",
-                   {parts.resource_class, "the other one"});
+            advise(report(see, see.line.all(),
+                          "the class has a `ResourceClass` already: this one replaces what both give, and adds its "
+                          "properties",
+                          {parts.resource_class, "the other one"}),
+                   "combine the two");
         parts.take_header(see, next_kind);
     }
 
@@ -104,8 +107,10 @@ private:
     }
     void take(const view &see, place &earlier, const char *text) {
         if (earlier.line != 0)
-            report(see, see.text_place(), std::string(text) + ": this line replaces the earlier one",
-                   {earlier, "the earlier one"});
+            advise(report(see, see.text_place(), std::string(text) + ": this line replaces the earlier one",
+                          {earlier, "the earlier one"}),
+                   see.attr().ta_type == AT_DEFAULT_VALUE ? "remove one of them, or choose an array type"
+                                                          : "remove one of them");
         earlier = {see.line.number, 0, 0};
     }
 

@@ -42,6 +42,7 @@ private:
     bool open = false;
 };
 
+/* A header that is not understood may be the run's. */
 class sd_without_run : public watcher {
 public:
     using watcher::watcher;
@@ -51,9 +52,12 @@ public:
         latest.take_value(see);
     }
     void stanza_end(const view &see, int next_kind) override {
-        if (latest.is_settled(next_kind) && !latest.has_run && see.errors() == 0)
-            report(latest.header.at, latest.header.source,
-                   "attribute of structured data without elements: it has no value");
+        bool understood = next_kind != NO_KIND || see.line.ended;
+        bool contains_run = see.known.kind != NO_KIND && see.known.stanza().misplaced;
+        if (latest.is_settled(next_kind) && !latest.has_run && understood && !contains_run)
+            advise(report(latest.header.at, latest.header.source,
+                          "attribute of structured data without elements: it has no value"),
+                   "put its elements directly after it");
     }
 
 private:
@@ -71,23 +75,50 @@ public:
     void stanza_end(const view &see, int next_kind) override {
         bool settled = latest.is_settled(next_kind);
         if (settled && latest.has_run && see.line.ended && see.compiler.run_makes_value())
-            report(latest.header.at, latest.header.source,
-                   "the elements end the file: the attribute is completed before them and has no value");
+            advise(report(latest.header.at, latest.header.source,
+                          "the elements end the file: the attribute is completed before them and has no value"),
+                   "put another stanza after the elements");
     }
 
 private:
     sd_attribute latest;
 };
 
+/* A run that does not belong to what it follows. */
 class stray_run : public watcher {
 public:
     using watcher::watcher;
 
     void before_step(const view &see, int next_kind) override {
-        bool begins = is_action_run(next_kind) && (!see.compiler.run_is_open() || see.known.kind != next_kind);
-        if (begins && !see.known.lost.owner && !see.compiler.is_open(SC_RESOURCE_ACTION) &&
+        if (next_kind == NO_KIND || !is_sd_kind(next_kind) ||
+            (see.compiler.run_is_open() && see.known.kind == next_kind))
+            return;
+        if (is_action_run(next_kind))
+            look_for_action(see);
+        else if (see.known.kind != NO_KIND && is_attribute_run(see.known.kind) && see.compiler.run_makes_value())
+            advise(report(see, see.line.all(),
+                          "these elements directly follow those of an attribute: whose they are is not defined"),
+                   "put a stanza of another kind between them");
+        else if (is_attribute_run(next_kind))
+            look_at_attribute(see, next_kind);
+    }
+
+private:
+    void look_for_action(const view &see) {
+        if (!see.known.lost.owner && !see.compiler.is_open(SC_RESOURCE_ACTION) &&
             !see.compiler.is_open(SC_CLASS_ACTION))
-            report(see, see.line.all(), "no action is open: these elements belong to nothing");
+            advise(report(see, see.line.all(), "no action is open: these elements belong to nothing"),
+                   "put them directly after their action");
+    }
+    void look_at_attribute(const view &see, int next_kind) {
+        if (see.known.kind == NO_KIND || table_of(see.known.kind).sc_attr == nullptr || !see.compiler.run_makes_value())
+            return;
+        bool persistent = table_of(see.known.kind).sc_attr->sd_attr_type == 0;
+        int right = persistent ? SC_PATTR_SD_DEFINITION : SC_DATTR_SD_DEFINITION;
+        if (next_kind != right)
+            advise(report(see, see.line.all(),
+                          "these elements follow a " + language::quoted(table_of(see.known.kind).sc_name)),
+                   "write " + language::quoted(table_of(right).sc_name));
     }
 };
 

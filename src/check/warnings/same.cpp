@@ -3,14 +3,49 @@
 #include "check/first_lines.h"
 #include "check/warnings/watcher.h"
 
+#include <array>
+#include <optional>
+#include <string>
 #include <string_view>
 
 namespace check {
 
 namespace {
 
-std::string another(const view &see, const char *what) {
-    return "another " + language::quoted(table_of(see.known.kind).sc_name) + " has the same " + what;
+/* The kind whose attributes share a namespace with those of a kind: persistent and dynamic ones of a resource, or of
+ * the class. */
+std::optional<int> partner_of(int kind) {
+    switch (kind) {
+    case SC_PERSISTENT_RESOURCE_ATTRIBUTE:
+        return SC_DYNAMIC_RESOURCE_ATTRIBUTE;
+    case SC_DYNAMIC_RESOURCE_ATTRIBUTE:
+        return SC_PERSISTENT_RESOURCE_ATTRIBUTE;
+    case SC_PERSISTENT_CLASS_ATTRIBUTE:
+        return SC_DYNAMIC_CLASS_ATTRIBUTE;
+    case SC_DYNAMIC_CLASS_ATTRIBUTE:
+        return SC_PERSISTENT_CLASS_ATTRIBUTE;
+    default:
+        return std::nullopt;
+    }
+}
+
+std::string another(int kind, const char *what) {
+    return "another " + language::quoted(table_of(kind).sc_name) + " has the same " + what;
+}
+
+std::string partner_has(int partner, const char *what) {
+    return "a " + language::quoted(table_of(partner).sc_name) + " has the same " + what;
+}
+
+note first_given(int line) {
+    return {{line, 0, 0}, "first given here"};
+}
+
+void to_lower(std::string_view text, std::string &lower) {
+    lower = text;
+    for (char &c : lower)
+        if (c >= 'A' && c <= 'Z')
+            c = static_cast<char>(c - 'A' + 'a');
 }
 
 class same_name : public watcher {
@@ -19,18 +54,54 @@ public:
     static constexpr std::array types = {AT_STRING, AT_SD_NAME};
 
     void value(const view &see) override {
-        if (int first = earlier(see); first != 0)
-            report(see, see.value_place(), another(see, "name"), {{first, 0, 0}, "first given here"});
+        int kind = see.known.kind;
+        std::string_view attr = see.attr().ta_name;
+        bool is_name = attr == "Name" || attr == "ElementName" || attr == "VariableClass";
+        if (!is_name || kind == SC_RESOURCE_CLASS || (attr == "VariableClass" && kind != SC_RESOURCE_VARIABLE_CLASS))
+            return;
+        int first = earlier(see);
+        int without_case = earlier_without_case(see);
+        std::optional<int> partner = partner_of(kind);
+        int of_partner = partner ? see.known.declared.names[index_of(*partner)].find(see.value()) : 0;
+        if (first != 0)
+            advise(report(see, see.value_place(), another(kind, "name"), first_given(first)), "rename one of them");
+        else if (of_partner != 0)
+            advise(report(see, see.value_place(), partner_has(*partner, "name"), first_given(of_partner)),
+                   "rename one of them");
+        else if (without_case != 0)
+            advise(report(see, see.value_place(), "this name differs from another one only in case",
+                          {{without_case, 0, 0}, "the other one"}),
+                   "rename one of them, or spell them alike if they are meant to be one");
+    }
+
+    /* Elements are named within their run, and all but variable classes within their class. */
+    void before_step(const view &see, int next_kind) override {
+        if (next_kind < 0)
+            return;
+        if (is_sd_kind(next_kind) && (!see.compiler.run_is_open() || see.known.kind != next_kind))
+            lower_names[index_of(next_kind)].clear();
+        if (next_kind != SC_CONTROL_DEFINITION || !see.compiler.class_is_open())
+            return;
+        for (size_t kind = 0; kind < SC_COUNT; ++kind)
+            if (kind != SC_RESOURCE_VARIABLE_CLASS)
+                lower_names[kind].clear();
     }
 
 private:
-    /* The line that gave the current line's name first; 0: none did. Variable classes belong to no class. */
+    /* The line that gave the current line's name first; 0: none did. */
     int earlier(const view &see) {
         if (see.known.kind != SC_RESOURCE_VARIABLE_CLASS)
             return see.known.declared.earlier_name;
-        if (std::string_view(see.attr().ta_name) != "VariableClass")
-            return 0;
         int &line = variable_classes.line_of(see.value());
+        int first = line;
+        if (first == 0)
+            line = see.line.number;
+        return first;
+    }
+    int earlier_without_case(const view &see) {
+        std::optional<int> partner = partner_of(see.known.kind);
+        to_lower(see.value(), lower);
+        int &line = lower_names[index_of(partner ? std::min(*partner, see.known.kind) : see.known.kind)].line_of(lower);
         int first = line;
         if (first == 0)
             line = see.line.number;
@@ -38,6 +109,8 @@ private:
     }
 
     first_lines variable_classes;
+    std::array<first_lines, SC_COUNT> lower_names; /* partners share the lower kind's */
+    std::string lower;
 };
 
 class same_id : public watcher {
@@ -47,7 +120,15 @@ public:
 
     void value(const view &see) override {
         if (int first = see.known.declared.earlier_id; first != 0)
-            report(see, see.value_place(), another(see, "Id"), {{first, 0, 0}, "first given here"});
+            return advise(report(see, see.value_place(), another(see.known.kind, "Id"), first_given(first)),
+                          "give one of them another number");
+        std::optional<int> partner = partner_of(see.known.kind);
+        check::number given(see.value(), 0);
+        if (!partner || given.read == 0)
+            return;
+        if (int first = see.known.declared.ids[index_of(*partner)].find(static_cast<vx_uint32_t>(given.value)))
+            advise(report(see, see.value_place(), partner_has(*partner, "Id"), first_given(first)),
+                   "give one of them another number");
     }
 };
 

@@ -8,6 +8,8 @@
 #include <cstdlib>
 #include <span>
 #include <string>
+#include <string_view>
+#include <utility>
 
 namespace check {
 
@@ -76,10 +78,14 @@ private:
         stored.resize(bytes.size(), '\0');
         place at = see.part_of_value(offset, part.size());
         bool is_short = bytes.size() <= SHOWN_MAX;
+        size_t text = std::min(part.find_first_not_of(" \t"), part.size());
+        std::string cure = part.substr(text).starts_with("0x") ? "remove the blank in front of `0x`"
+                           : is_short                          ? "write " + hex_text(bytes)
+                                                               : "write `0x` and two hexadecimal digits for each byte";
         report(see, at,
                "the first four bytes of a Binary without `0x` are lost" +
                    (is_short ? ": stored are " + hex_text(stored) : std::string()),
-               {at, is_short ? "write " + hex_text(bytes) : "write `0x` and two hexadecimal digits for each byte"});
+               {at, std::move(cure)});
     }
 };
 
@@ -91,16 +97,13 @@ public:
                                          AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
 
     void value(const view &see) override {
-        std::string_view raw = see.line.raw;
+        std::string_view rest = see.comment_at_value();
+        if (rest.empty() || !is_text(see))
+            return;
         place value = see.value_place();
         size_t begin = value.column - 1, end = begin + value.length;
-        std::string_view rest = raw.substr(std::min(end, raw.size()));
-        bool comment = rest.starts_with('#') || rest.starts_with("//") || rest.starts_with("/*");
-        if (!comment || !is_text(see))
-            return;
-        rest = rest.substr(0, rest.find_last_not_of(" \t\r") + 1);
         std::string sign(rest.substr(0, rest.starts_with('#') ? 1 : 2));
-        std::string_view whole = raw.substr(begin, value.length + rest.size());
+        std::string_view whole = see.line.raw.substr(begin, value.length + rest.size());
         std::string cure = whole.find_first_of("\"\\") == std::string_view::npos
                                ? "write `" + std::string(see.attr().ta_name) + "=\"" + std::string(whole) + "\"`"
                                : std::string("quote the value");
@@ -130,11 +133,11 @@ public:
     static constexpr std::array types = {AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
 
     void value(const view &see) override {
-        if (!is_string(see))
+        if (!is_string(see) && !is_binary(see))
             return;
         if (is_valid_value(see))
             look_at_bounds(see);
-        else if (see.compiler.data_type() == VX_CHAR_PTR_ARRAY)
+        else if (is_vx_array(see.compiler.data_type()))
             look_at_element(see);
     }
 
@@ -163,6 +166,59 @@ private:
     }
 };
 
+/* Names are compared with their blanks. Of other texts only a blank that comes by itself is strange: blanks are part of
+ * what is quoted. */
+class outer_blank : public watcher {
+public:
+    using watcher::watcher;
+    static constexpr std::array types = {AT_STRING,      AT_SD_NAME,        AT_MANAGER,       AT_LOCATOR,
+                                         AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
+
+    void value(const view &see) override {
+        std::string_view text = see.value();
+        if (!is_blank(text.front()) && !is_blank(text.back()))
+            return;
+        size_t begin = std::min(text.find_first_not_of(BLANKS), text.size());
+        if (!is_strange(see, begin))
+            return;
+        if (begin == text.size())
+            return advise(report(see, see.value_place(), "the text that is stored consists of blanks"), "give a text");
+        size_t end = text.find_last_not_of(BLANKS) + 1;
+        bool in_front = begin > 0;
+        place at = in_front ? see.part_of_value(0, begin) : see.part_of_value(end, text.size() - end);
+        std::string core(text.substr(begin, end - begin));
+        if (see.is_quoted())
+            core = '"' + core + '"';
+        advise(
+            report(see, at, std::string("the text that is stored ") + (in_front ? "begins" : "ends") + " with a blank"),
+            "write `" + std::string(see.attr().ta_name) + "=" + core + "`" +
+                (see.is_quoted() || is_name(see) ? "" : ", or quote the text with its blanks"));
+    }
+
+private:
+    static constexpr const char *BLANKS = " \t";
+
+    static bool is_blank(char c) {
+        return c == ' ' || c == '\t';
+    }
+    static bool is_name(const view &see) {
+        switch (see.attr().ta_type) {
+        case AT_STRING:
+        case AT_SD_NAME:
+        case AT_MANAGER:
+        case AT_LOCATOR:
+            return true;
+        default:
+            return false;
+        }
+    }
+    static bool is_strange(const view &see, size_t blanks_in_front) {
+        if (is_name(see))
+            return !std::string_view(see.attr().ta_name).ends_with("Expression");
+        return is_string(see) && blanks_in_front > 0 && !see.is_quoted();
+    }
+};
+
 } // namespace
 
 made_watcher make_lost_bytes(const watcher_setup &setup) {
@@ -175,6 +231,10 @@ made_watcher make_comment_in_value(const watcher_setup &setup) {
 
 made_watcher make_comma_list(const watcher_setup &setup) {
     return make<comma_list>(setup);
+}
+
+made_watcher make_outer_blank(const watcher_setup &setup) {
+    return make<outer_blank>(setup);
 }
 
 } // namespace check

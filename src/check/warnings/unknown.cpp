@@ -1,18 +1,33 @@
-/* unknown.cpp: warnings about names that nothing in the source has, or uses. They are reported at the end, and only for
- * a source without errors: all that could have the name must have been understood. */
+/* unknown.cpp: warnings about names that nothing in the source has, or uses. They are reported at the end, unless a
+ * line or a stanza that was not understood may have, or use, the name. */
 
 #include "check/first_lines.h"
-#include "check/lacking.h"
 #include "check/warnings/watcher.h"
 
 #include <algorithm>
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace check {
 
 namespace {
+
+/* Whether the stanza that ends has a name in a line that was not understood. */
+bool has_lost_name(const view &see) {
+    const stanza_record &stanza = see.known.stanza();
+    const auto attrs = table_of(see.known.kind).sc_attrs;
+    auto name = std::find_if(attrs.begin(), attrs.end(), [](const table_attrs &each) {
+        return std::string_view(each.ta_name) == "Name" || std::string_view(each.ta_name) == "VariableClass";
+    });
+    return stanza.given[static_cast<size_t>(name - attrs.begin())] == 0;
+}
+
+/* There may be no name to suggest. */
+std::string cure(std::string suggestion) {
+    return suggestion.empty() ? "define it, or correct the name" : std::move(suggestion);
+}
 
 /* The locator is looked up in the last class. */
 class unknown_locator : public watcher {
@@ -23,16 +38,21 @@ public:
     void value(const view &see) override {
         locator = see.value_mention();
     }
-
+    void stanza_end(const view &see, int) override {
+        if (see.known.kind == SC_PERSISTENT_RESOURCE_ATTRIBUTE)
+            name_lost = name_lost || has_lost_name(see);
+    }
     void source_end(const view &see) override {
         const first_lines &attributes = see.known.declared.names[SC_PERSISTENT_RESOURCE_ATTRIBUTE];
-        if (see.errors() == 0 && locator && !attributes.has(locator->text))
-            report(locator->at, locator->source, "no `PersistentResourceAttribute` has this name",
-                   {locator->at, language::suggestion(locator->text, attributes.all())});
+        if (locator && !attributes.has(locator->text) && !name_lost &&
+            !see.known.lost.may_be(SC_PERSISTENT_RESOURCE_ATTRIBUTE))
+            advise(report(locator->at, locator->source, "no `PersistentResourceAttribute` has this name"),
+                   cure(language::suggestion(locator->text, attributes.all())));
     }
 
 private:
     std::optional<mention> locator;
+    bool name_lost = false;
 };
 
 /* Reports each name once, where it is given first. */
@@ -54,14 +74,14 @@ public:
         first = see.line.number;
     }
 
-    void stanza_end(const view &see, int next_kind) override {
-        language::name_list lacking = lacking_unnoticed(see, next_kind);
-        unnamed = unnamed || std::find(lacking.begin(), lacking.end(), "VariableClass") != lacking.end();
+    void stanza_end(const view &see, int) override {
+        if (see.known.kind == SC_RESOURCE_VARIABLE_CLASS)
+            unnamed = unnamed || has_lost_name(see);
     }
 
     void source_end(const view &see) override {
         constexpr size_t COMPARED_MAX = 1'000'000; /* names in all, for the time not to be quadratic */
-        if (see.errors() > 0 || unnamed)
+        if (unnamed || see.known.lost.may_be(SC_RESOURCE_VARIABLE_CLASS))
             return;
         language::name_list names = defined.all();
         size_t compared = 0;
@@ -69,8 +89,8 @@ public:
             if (defined.has(each.text))
                 continue;
             bool suggests = (compared += names.size()) <= COMPARED_MAX;
-            report(each.at, each.source, "no `ResourceVariableClass` has this name",
-                   {each.at, suggests ? language::suggestion(each.text, names) : std::string()});
+            advise(report(each.at, each.source, "no `ResourceVariableClass` has this name"),
+                   cure(suggests ? language::suggestion(each.text, names) : std::string()));
         }
     }
 
@@ -80,6 +100,10 @@ private:
     first_lines defined;
     bool unnamed = false; /* a variable class lacks its name: it may be any of those that are used */
 };
+
+bool is_dynamic(int kind) {
+    return kind == SC_DYNAMIC_RESOURCE_ATTRIBUTE || kind == SC_DYNAMIC_CLASS_ATTRIBUTE;
+}
 
 /* Reports each name once, where it is defined first. A name that nothing defines may be a misspelt one of these. */
 class unused_variable_class : public watcher {
@@ -97,20 +121,28 @@ public:
         first = see.line.number;
     }
 
+    void stanza_end(const view &see, int) override {
+        if (is_dynamic(see.known.kind))
+            use_lost = use_lost || see.known.stanza().may_have_lost({AT_STRING});
+    }
     void source_end(const view &see) override {
         language::name_list names = used.all();
         bool all_known = std::all_of(names.begin(), names.end(), [&](auto name) { return defined_lines.has(name); });
-        if (see.errors() > 0 || !all_known)
+        const lost_stanzas &lost = see.known.lost;
+        if (!all_known || use_lost || lost.may_be(SC_DYNAMIC_RESOURCE_ATTRIBUTE) ||
+            lost.may_be(SC_DYNAMIC_CLASS_ATTRIBUTE))
             return;
         for (const mention &each : defined)
             if (!used.has(each.text))
-                report(each.at, each.source, "no dynamic attribute belongs to this variable class");
+                advise(report(each.at, each.source, "no dynamic attribute belongs to this variable class"),
+                       "remove it, or give attributes its name");
     }
 
 private:
     std::vector<mention> defined; /* each name once */
     first_lines defined_lines;
     first_lines used;
+    bool use_lost = false; /* an attribute may have one of these names in a line that was not understood */
 };
 
 } // namespace

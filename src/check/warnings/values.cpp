@@ -69,13 +69,19 @@ public:
         case VX_BINARY_PTR:
         case VX_RSRC_HANDLE_PTR:
         case VX_SD_PTR:
-            report(see, see.text_place(),
-                   "the type " + language::quoted(see.known.stanza().data_type.text) +
-                       " has no range: this line is ignored");
-            return;
+            return look_at(see);
         default:
             return;
         }
+    }
+
+private:
+    void look_at(const view &see) {
+        bool text = scalar_vx(see.compiler.data_type()) == VX_CHAR_PTR;
+        advise(report(see, see.text_place(),
+                      "the type " + language::quoted(see.known.stanza().data_type.text) +
+                          " has no range: this line is ignored"),
+               text ? "remove the line, or write a `ValidStateValue`" : "remove the line");
     }
 };
 
@@ -102,10 +108,11 @@ private:
         if (name.empty())
             return;
         if (std::find(earlier.begin(), earlier.end(), name) != earlier.end())
-            return report(see, at, "this property is given already");
+            return advise(report(see, at, "this property is given already"), "remove one of the two");
         for (std::string_view other : earlier)
             if (contradict(name, other))
-                return report(see, at, language::quoted(name) + " contradicts " + language::quoted(other));
+                return advise(report(see, at, language::quoted(name) + " contradicts " + language::quoted(other)),
+                              "remove one of the two");
     }
     /* Whether a definition must, may or must not give the attribute. What it must give cannot be only read. */
     static bool contradict(std::string_view one, std::string_view other) {

@@ -56,13 +56,19 @@ public:
     virtual void source_end(const view &) {}
 
 protected:
-    /* With a note, if it has a text. */
-    void report(const place &at, std::string_view source, std::string text, note more = {}, correction fix = {}) {
-        to.found.warn(to.known, at, source, std::move(text), std::move(more)).fix = std::move(fix);
+    /* With a note, if it has a text. The finding can be given more notes until the next one is reported. */
+    finding &report(const place &at, std::string_view source, std::string text, note more = {}, correction fix = {}) {
+        finding &found = to.found.warn(to.known, at, source, std::move(text), std::move(more));
+        found.fix = std::move(fix);
+        return found;
     }
     /* About the current line. */
-    void report(const view &see, const place &at, std::string text, note more = {}, correction fix = {}) {
-        report(at, see.line.raw, std::move(text), std::move(more), std::move(fix));
+    finding &report(const view &see, const place &at, std::string text, note more = {}, correction fix = {}) {
+        return report(at, see.line.raw, std::move(text), std::move(more), std::move(fix));
+    }
+    /* Adds a note that says what to do. */
+    static void advise(finding &about, std::string cure) {
+        about.notes.push_back({about.at, std::move(cure)});
     }
 
 private:

@@ -26,7 +26,8 @@ void watchers::attribute(const view &see) const {
     if (!of_event[ON_QUOTED_VALUE].empty() && see.is_quoted())
         for (watcher *each : of_event[ON_QUOTED_VALUE])
             each->quoted_value(see);
-    if (see.known.stanza().misplaced)
+    if (see.known.stanza().misplaced &&
+        see.attr().ta_type != AT_SD_DATA_TYPE) /* whose ever the type is, it is unknown */
         return;
     if (!of_event[ON_NUMBER].empty())
         odd_numbers(see);

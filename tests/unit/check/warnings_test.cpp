@@ -96,7 +96,8 @@ TEST(Numbers, AreReportedPartByPart) {
 }
 
 TEST(LowAboveHigh, IsReportedForNumbersOnly) {
-    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tValidValue=1,-1\n")), codes{"S519 23:13+4"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tValidValue=1,-1\n\tDefaultValue=9\n")),
+              codes{"S519 23:13+4"});
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Float32", "\tValidValue=1.5,1.25\n")), codes{"S519 23:13+8"});
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tValidValue=-1,1\n")), codes());
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tValidValue=b,a\n")), codes());
@@ -106,6 +107,71 @@ TEST(UnusedDefault, IsReportedForClassAttributes) {
     std::string stanza = persistent("A", "0", "Int32", "\tDefaultValue=1\n");
     EXPECT_EQ(found_in(CLASS + stanza), codes());
     EXPECT_EQ(found_in(CLASS + stanza.replace(0, 27, "PersistentClassAttribute")), codes{"S511 23:2+12"});
+}
+
+TEST(InvalidDefault, IsReportedAtItsLine) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tDefaultValue=3\n\tValidValue=1,2\n")),
+              codes{"S533 23:15+1"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tDefaultValue=3\n\tValidValue=1,2\n\tValidValue=3\n")),
+              codes());
+    EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "A", "0", "\tInitialValue=3\n\tRange=0,2\n")), codes{"S533 24:15+1"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Float32", "\tDefaultValue=nan\n\tValidValue=0,1\n")), codes());
+}
+
+TEST(InvalidDefault, IsThatOfTheTypeIfNoneIsGiven) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "UInt64Array", "\tValidValue=1,2\n")), codes{"S533 16:1+27"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tValidValue=a\n")), codes{"S533 16:1+27"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tValidValue=-1,1\n")), codes());
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tProperties=Public,ReqdForDefine\n\tValidValue=1\n")),
+              codes());
+    EXPECT_EQ(found_in(CLASS + dynamic(OF_CLASS, "A", "0", "\tRange=1,9\n")), codes{"S533 16:1+21"});
+}
+
+TEST(InvalidDefault, IsNotReportedBesideAnotherMistakeOfTheValues) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tValidValue=2,1\n")), codes{"S519 23:13+3"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tValidValue=a#b\n")), codes{"S522 23:14+2"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Binary", "\tValidValue=a\n")), codes{"S521 23:13+1"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tValidValue=1\n\tValidVlaue=0\n")),
+              codes{"S106 24:2+10"});
+}
+
+TEST(Overlap, IsReportedAtTheLaterLine) {
+    std::string given = "\tDefaultValue=1\n\tValidValue=1,5\n";
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", given + "\tValidValue=5\n")), codes{"S535 25:13+1"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", given + "\tValidValue=6\n")), codes());
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tVarietyRange=0x1,2\n")), codes{"S535 23:15+5"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tVarietyRange=2,2\n")), codes());
+}
+
+TEST(OuterBlank, IsReportedInNamesAndUnquotedTexts) {
+    EXPECT_EQ(found_in(CLASS + persistent(" \tA", "0", "Int32")), codes{"S536 17:7+2"});
+    EXPECT_EQ(found_in(CLASS + persistent("\"A \"", "0", "Int32")), codes{"S536 17:9+1"});
+    EXPECT_EQ(found_in(CLASS + persistent("\" \"", "0", "Int32")), codes{"S536 17:8+1"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tDefaultValue= x\n")), codes{"S536 23:15+1"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tDefaultValue=\" x \"\n")), codes());
+    EXPECT_EQ(found_in(CLASS + persistent("A", " 0", "Int32", "\tDefaultValue= 5\n")), codes());
+}
+
+TEST(Unbalanced, IsReportedAtTheLoneCharacter) {
+    auto of = [](const std::string &text) {
+        return found_in(CLASS + dynamic(RESOURCE, "A", "0", "\tExpression=" + text + "\n"));
+    };
+    EXPECT_EQ(of("(A > 1"), codes{"S537 24:13+1"});
+    EXPECT_EQ(of("((A > 1) || A == 0"), codes{"S537 24:13+1"});
+    EXPECT_EQ(of("A > 1)"), codes{"S537 24:18+1"});
+    EXPECT_EQ(of("A == \"b"), codes{"S537 24:18+1"});
+    EXPECT_EQ(of("A == 'it"), codes{"S537 24:18+1"});
+    EXPECT_EQ(of("(A == \"it's (\") && A != ')'"), codes());
+    EXPECT_EQ(of("A == \\\""), codes());
+}
+
+TEST(ClassBit, IsReportedInAVariableClassOnly) {
+    std::string defined = "ResourceVariableClass\n\tVariableClass=V\n\tObservationInterval=2\n\tReportingInterval=2\n";
+    std::string named = "\tVariableClass=V\n";
+    EXPECT_EQ(found_in(CLASS + defined + dynamic(RESOURCE, "A", "0x8000", named)), codes{"S534 24:5+6"});
+    EXPECT_EQ(found_in(CLASS + defined + dynamic(OF_CLASS, "A", "65535", named)), codes{"S534 24:5+5"});
+    EXPECT_EQ(found_in(CLASS + defined + dynamic(RESOURCE, "A", "0x17FFF", named)), codes());
+    EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "A", "0x8000")), codes());
 }
 
 TEST(Permission, IsOneKnownLetter) {
@@ -118,18 +184,21 @@ TEST(Permission, IsOneKnownLetter) {
 
 TEST(CommaList, IsReportedForTexts) {
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tValidValue=a,b,c\n")), codes{"S526 23:13+5"});
-    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tValidValue=a,b\n")), codes());
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tValidValue=a,b\n\tDefaultValue=a\n")), codes());
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "StringArray", "\tDefaultValue=a,b\n")), codes{"S526 23:15+3"});
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "StringArray", "\tDefaultValue=\"a,b\"\n")), codes());
 }
 
 TEST(IgnoredRange, IsReportedForTypesWithoutOne) {
-    std::string stanza = dynamic(RESOURCE, "A", "0", "\tRange=1,2\n");
+    std::string stanza = dynamic(RESOURCE, "A", "0", "\tRange=0,2\n");
     EXPECT_EQ(found_in(CLASS + stanza), codes());
     EXPECT_EQ(found_in(CLASS + stanza.replace(stanza.find("UInt32"), 6, "String")), codes{"S527 24:2+9"});
 }
 
 TEST(NoExpression, IsReportedAtWhatNeedsOne) {
+    std::string described = "\tExpression=y\n\tReArmDescription=1\n";
+    EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "A", "0", described)), codes{"S528 25:2+16"});
+    EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "A", "0", described + "\tReArmExpression=x\n")), codes());
     EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "A", "0", "\tReArmExpression=x\n")), codes{"S528 24:2+15"});
     EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "A", "0", "\tReArmExpression=x\n\tExpression=y\n")), codes());
 }
@@ -138,6 +207,13 @@ TEST(Group, IsANumberAndNot255) {
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tGroupName=1\n")), codes{"S529 23:2+9"});
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tGroupID=255\n")), codes{"S529 23:10+3"});
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tGroupName=1\n\tGroupID=254\n")), codes());
+}
+
+TEST(Group, HasOneName) {
+    std::string first = CLASS + persistent("A", "0", "Int32", "\tGroupID=1\n\tGroupName=5\n");
+    EXPECT_EQ(found_in(first + persistent("B", "1", "Int32", "\tGroupName=6\n\tGroupID=1\n")), codes{"S529 32:2+9"});
+    EXPECT_EQ(found_in(first + persistent("B", "1", "Int32", "\tGroupName=0x5\n\tGroupID=1\n")), codes());
+    EXPECT_EQ(found_in(first + persistent("B", "1", "Int32", "\tGroupName=6\n\tGroupID=2\n")), codes());
 }
 
 TEST(Properties, AreReportedIfRepeatedOrContradictory) {
@@ -161,7 +237,7 @@ TEST(SameName, IsReportedWithinAKind) {
     std::string source = CLASS + persistent("A", "0", "Int32") + persistent("A", "1", "Int32");
     EXPECT_EQ(found_in(source), codes{"S506 24:7+1"});
     EXPECT_EQ(found_in::findings_in(source).at(0).notes.at(0).at.line, 17);
-    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32") + dynamic(RESOURCE, "A", "0")), codes());
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32") + dynamic(OF_CLASS, "A", "0")), codes());
 }
 
 TEST(SameId, IsReportedForEqualNumbers) {
@@ -169,12 +245,34 @@ TEST(SameId, IsReportedForEqualNumbers) {
     EXPECT_EQ(found_in(source), codes{"S507 27:5+4"});
 }
 
-TEST(UnknownLocator, IsReportedWithoutErrorsOnly) {
+TEST(SameName, IsReportedForPersistentAndDynamicAttributes) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32") + dynamic(RESOURCE, "A", "1")), codes{"S506 24:7+1"});
+    EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "A", "0") + persistent("B", "0", "Int32")), codes{"S507 28:5+1"});
+    EXPECT_EQ(found_in(CLASS + dynamic(OF_CLASS, "A", "0") + persistent("A", "0", "Int32")), codes());
+}
+
+TEST(SameName, IsReportedForNamesThatDifferInCase) {
+    EXPECT_EQ(found_in(CLASS + persistent("Size", "0", "Int32") + persistent("size", "1", "Int32")),
+              codes{"S506 24:7+4"});
+    EXPECT_EQ(found_in(CLASS + persistent("Size", "0", "Int32") + dynamic(RESOURCE, "SIZE", "1")),
+              codes{"S506 24:7+4"});
+    EXPECT_EQ(found_in(CLASS + persistent("Size", "0", "Int32") + persistent("Sizes", "1", "Int32")), codes());
+}
+
+TEST(Narrowed, IsReportedForTheIdOfTheLocatorsAttribute) {
+    std::string source = CLASS;
+    source.insert(source.find("ClassTo"), "\tLocator=A\n");
+    EXPECT_EQ(found_in(source + persistent("A", "65535", "Int32")), codes{"S508 21:5+5"});
+    EXPECT_EQ(found_in(source + persistent("A", "65534", "Int32") + persistent("B", "65536", "Int32")), codes());
+}
+
+TEST(UnknownLocator, IsReportedUnlessAnErrorMayHideTheName) {
     std::string source = CLASS;
     source.insert(source.find("ClassTo"), "\tLocator=Nmae\n");
     EXPECT_EQ(found_in(source + persistent("Name", "0", "String")), codes{"S504 10:10+4"});
     EXPECT_EQ(found_in(source + persistent("Nmae", "0", "String")), codes());
-    EXPECT_EQ(found_in(source + persistent("Name", "0", "Sting")), codes{"S202 22:11+5"});
+    EXPECT_EQ(found_in(source + persistent("Name", "0", "Sting")), (codes{"S504 10:10+4", "S202 22:11+5"}));
+    EXPECT_EQ(found_in(source + persistent("\"Nmae", "0", "String")), codes{"S104 18:7+5"});
 }
 
 TEST(UnknownVariableClass, IsReportedOnceForEachName) {
@@ -206,7 +304,7 @@ TEST(Overridden, IsReportedAtTheLineThatCounts) {
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32Array", "\tDefaultValue=1\n\tDefaultValue=1\n")), codes());
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32",
                                           "\tValidValue=1\n\tValueDisplayName=1\n\tValueDisplayName=2\n"
-                                          "\tValidValue=2\n\tValueDisplayName=3\n")),
+                                          "\tValidValue=2\n\tValueDisplayName=3\n\tDefaultValue=1\n")),
               codes{"S525 25:2+18"});
 }
 
@@ -246,6 +344,20 @@ TEST(StrayRun, IsReportedWithoutAnAction) {
               codes());
 }
 
+TEST(StrayRun, IsReportedAfterTheOtherKindOfAttribute) {
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "SD") + element("DAttrSDDefinition", "Int32") +
+                       persistent("B", "1", "Int32")),
+              codes{"S518 23:1+17"});
+}
+
+TEST(StrayRun, IsReportedDirectlyAfterTheElementsOfAnAttribute) {
+    std::string attribute = CLASS + persistent("A", "0", "SD") + element("PAttrSDDefinition", "Int32");
+    std::string run = element("ResetSDDefinition", "Int32");
+    EXPECT_EQ(found_in(attribute + run), codes{"S518 29:1+17"});
+    EXPECT_EQ(found_in(attribute + persistent("B", "1", "Int32") + run), codes());
+    EXPECT_EQ(found_in(CLASS + run + element("OnlineSDDefinition", "Int32")), codes());
+}
+
 TEST(ElementType, IsReportedWhereTheCompilerAcceptsIt) {
     EXPECT_EQ(found_in(CLASS + element("DefineSDDefinition", "Sting")), codes{"S513 21:11+5"});
 }
@@ -257,19 +369,31 @@ TEST(ElementType, IsReportedAlthoughTheAttributeOfTheElementHasAnError) {
 }
 
 TEST(RangeElsewhere, IsReportedIfTheOtherKindIsOpen) {
-    EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "A", "0") + dynamic(OF_CLASS, "B", "1", "\tRange=1,2\n")),
+    EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "A", "0") + dynamic(OF_CLASS, "B", "1", "\tRange=0,2\n")),
               codes{"S503 32:2+9"});
 }
 
 TEST(RangeElsewhere, IsReportedIfTheOtherKindIsCompletedFirst) {
-    EXPECT_EQ(found_in(CLASS + dynamic(OF_CLASS, "A", "0") + dynamic(RESOURCE, "B", "1", "\tRange=1,2\n") +
+    EXPECT_EQ(found_in(CLASS + dynamic(OF_CLASS, "A", "0") + dynamic(RESOURCE, "B", "1", "\tRange=0,2\n") +
                        dynamic(OF_CLASS, "C", "2")),
               codes{"S503 32:2+9"});
-    EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "B", "1", "\tRange=1,2\n")), codes());
+    EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "B", "1", "\tRange=0,2\n")), codes());
+}
+
+/* The mark that the second class attribute finds is that of the range before it. */
+TEST(RangeElsewhere, FollowsTheMark) {
+    std::vector<check::finding> found =
+        found_in::findings_in(CLASS + dynamic(OF_CLASS, "A", "0", "\tRange=0,2\n") + dynamic(RESOURCE, "B", "1") +
+                              dynamic(RESOURCE, "C", "2", "\tRange=0,4\n") + dynamic(OF_CLASS, "D", "3"));
+    ASSERT_EQ(found.size(), 2u);
+    EXPECT_EQ(found_in::shown(found[0]), "S503 24:2+9");
+    EXPECT_EQ(found[0].text.substr(0, 21), "because of this Range");
+    EXPECT_EQ(found_in::shown(found[1]), "S503 41:2+9");
+    EXPECT_EQ(found[1].text.substr(0, 18), "this Range is lost");
 }
 
 TEST(RangeElsewhere, IsNotReportedIfTheNextClassEndsTheAttribute) {
-    EXPECT_EQ(found_in(CLASS + dynamic(OF_CLASS, "A", "0") + dynamic(RESOURCE, "B", "1", "\tRange=1,2\n") +
+    EXPECT_EQ(found_in(CLASS + dynamic(OF_CLASS, "A", "0") + dynamic(RESOURCE, "B", "1", "\tRange=0,2\n") +
                        dynamic(OF_CLASS, "C", "2") + "ControlDefinition\n\tFileVersion=1\n"),
               (codes{"S514 41:1+17", "S514 41:1+17", "S523 41:1+17"})); /* the next class has no ResourceClass */
 }

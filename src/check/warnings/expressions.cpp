@@ -1,0 +1,75 @@
+/* expressions.cpp: a warning about expressions that cannot be complete. Their grammar is the runtime's; that
+ * parentheses and quotes come in pairs is all that is asked of them. */
+
+#include "check/warnings/watcher.h"
+
+#include <cstddef>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace check {
+
+namespace {
+
+/* What has no partner, and where. */
+struct lone_character {
+    size_t at;
+    char character;
+};
+
+/* The first closing character without an opening one, or else the last opening one without a closing one. A character
+ * after a backslash does not count, and parentheses in quotes do not. */
+std::optional<lone_character> lone_in(std::string_view text) {
+    std::vector<size_t> open; /* parentheses */
+    size_t quote = std::string_view::npos;
+    for (size_t at = 0; at < text.size(); ++at) {
+        char c = text[at];
+        bool quoted = quote != std::string_view::npos;
+        if (c == '\\')
+            ++at;
+        else if (quoted && c == text[quote])
+            quote = std::string_view::npos;
+        else if (!quoted && (c == '"' || c == '\''))
+            quote = at;
+        else if (!quoted && c == '(')
+            open.push_back(at);
+        else if (!quoted && c == ')' && open.empty())
+            return lone_character{at, c};
+        else if (!quoted && c == ')')
+            open.pop_back();
+    }
+    if (quote != std::string_view::npos)
+        return lone_character{quote, text[quote]};
+    if (!open.empty())
+        return lone_character{open.back(), '('};
+    return std::nullopt;
+}
+
+class unbalanced : public watcher {
+public:
+    using watcher::watcher;
+    static constexpr std::array types = {AT_STRING};
+
+    void value(const view &see) override {
+        std::string_view name = see.attr().ta_name;
+        if (name != "Expression" && name != "ReArmExpression")
+            return;
+        std::optional<lone_character> lone = lone_in(see.value());
+        if (!lone)
+            return;
+        std::string what(1, lone->character);
+        std::string partner = what == "(" ? ")" : what == ")" ? "(" : what;
+        advise(report(see, see.part_of_value(lone->at, 1), language::quoted(what) + " without its `" + partner + "`"),
+               "add the other one, or remove this one");
+    }
+};
+
+} // namespace
+
+made_watcher make_unbalanced(const watcher_setup &setup) {
+    return make<unbalanced>(setup);
+}
+
+} // namespace check

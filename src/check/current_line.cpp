@@ -96,9 +96,9 @@ edit current_line::replacement(place part, std::string_view source, std::string_
 }
 
 correction current_line::renamed(const place &part, std::string_view source, const language::guess &meant) const {
-    if (meant.name.empty() || std::binary_search(rests.begin(), rests.end(), part.line))
+    if (meant.name().empty() || std::binary_search(rests.begin(), rests.end(), part.line))
         return {};
-    return {meant.certain ? certainty::certain : certainty::likely, {replacement(part, source, meant.name)}};
+    return {meant.is_certain() ? certainty::certain : certainty::likely, {replacement(part, source, meant.name())}};
 }
 
 } // namespace check

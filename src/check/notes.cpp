@@ -2,6 +2,7 @@
 
 #include "check/notes.h"
 
+#include "check/meant.h"
 #include "check/numbers.h"
 #include "format/data_types.h"
 #include "format/names.h"
@@ -16,7 +17,6 @@ namespace check {
 namespace {
 
 using language::listed;
-using language::near_miss;
 using language::quoted;
 using language::suggestion;
 
@@ -113,11 +113,11 @@ void unknown_name(noting &n) {
     if (trimmed.size() < given.size() && find_attr(table, trimmed) != nullptr)
         return n.add_here("blanks in front of the = belong to the name");
     kind_set others = language::kinds_with(given);
-    language::name_list known = language::attribute_names(table);
-    if (near_miss(given, known).empty() && others.count() == 1)
-        n.add_here(belongs_to(others));
-    else
-        n.suggest(given, known);
+    language::guess meant = attribute_meant(n.see.known, n.kind, given);
+    if (meant.names.empty() && others.count() == 1)
+        return n.add_here(belongs_to(others));
+    n.add_here(suggestion(meant, language::attribute_names(table)));
+    n.replace(meant);
 }
 
 void too_early(noting &n) {

@@ -1,5 +1,6 @@
 /* recover_attribute.cpp: takes attribute lines, and continues after one that is refused. */
 
+#include "check/meant.h"
 #include "check/notes.h"
 #include "check/recovery.h"
 #include "language/names.h"
@@ -119,9 +120,8 @@ std::optional<int> recovery::type_meant() const {
     const srtable_ctrl &table = table_of(known.kind);
     std::string_view name = name_given();
     const table_attrs *attr = find_attr(table, name);
-    if (std::string_view meant = language::near_miss(name, language::attribute_names(table));
-        attr == nullptr && !meant.empty())
-        attr = find_attr(table, meant);
+    if (attr == nullptr)
+        attr = find_attr(table, attribute_meant(known, known.kind, name).name());
     return attr == nullptr ? std::nullopt : std::optional(attr->ta_type);
 }
 

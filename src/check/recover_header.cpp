@@ -185,8 +185,8 @@ void recovery::unknown_header(const attr_text &text, const fatal_exit &failure) 
     language::guess meant = language::meant_by(front, language::stanza_names());
     if (front.size() == name.size())
         error.fix = line.renamed(line.all(), line.raw, meant);
-    if (!meant.name.empty())
-        return take_header(line.replaced(meant.name), true);
+    if (!meant.name().empty())
+        return take_header(line.replaced(meant.name()), true);
     lose_stanza();
 }
 

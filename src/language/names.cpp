@@ -4,7 +4,9 @@
 
 #include "format/names.h"
 
+#include <algorithm>
 #include <span>
+#include <utility>
 
 namespace language {
 
@@ -14,6 +16,42 @@ template <class Properties> name_list names_of(const Properties &properties) {
     name_list names;
     for (const props_t &property : properties)
         names.emplace_back(property.s);
+    return names;
+}
+
+/* An attribute, and one that does the same in other kinds. */
+constexpr std::pair<std::string_view, std::string_view> sisters[] = {
+    {"Name", "ElementName"},
+    {"Name", "VariableClass"},
+    {"ElementName", "Name"},
+    {"Id", "ElementIndex"},
+    {"ElementIndex", "Id"},
+    {"DefaultValue", "InitialValue"},
+    {"InitialValue", "DefaultValue"},
+    {"ValidValue", "ValidStateValue"},
+    {"ValidStateValue", "ValidValue"},
+    {"Permission", "ClassPermTemplate"},
+    {"Permission", "ResourcePermTemplate"},
+    {"ClassPermTemplate", "Permission"},
+    {"ResourcePermTemplate", "Permission"},
+};
+
+/* The attributes of a kind that do what one of another kind does. */
+name_list sisters_of(std::string_view attribute, const srtable_ctrl &kind) {
+    name_list found;
+    for (const auto &[other, here] : sisters)
+        if (other == attribute && find_attr(kind, here) != nullptr)
+            found.push_back(here);
+    return found;
+}
+
+/* Of all kinds, each name once. */
+name_list all_attribute_names() {
+    name_list names;
+    for (const srtable_ctrl &kind : std::span(sc_tables).first(SC_COUNT))
+        for (const table_attrs &attr : kind.sc_attrs)
+            if (std::find(names.begin(), names.end(), attr.ta_name) == names.end())
+                names.emplace_back(attr.ta_name);
     return names;
 }
 
@@ -31,6 +69,16 @@ name_list attribute_names(const srtable_ctrl &kind) {
     for (const table_attrs &attr : kind.sc_attrs)
         names.emplace_back(attr.ta_name);
     return names;
+}
+
+guess attribute_meant_by(std::string_view text, const srtable_ctrl &kind) {
+    name_list known = attribute_names(kind);
+    if (!near_miss(text, known).empty())
+        return meant_by(text, known);
+    if (kinds_with(text).any())
+        return {sisters_of(text, kind)};
+    guess part = meant_by(text, known);
+    return part.names.empty() ? guess{sisters_of(meant_by(text, all_attribute_names()).name(), kind)} : part;
 }
 
 kind_set kinds_with(std::string_view attribute) {

@@ -22,6 +22,29 @@ char lower(char c) {
 constexpr size_t LONGEST_NAME = 64; /* characters; a longer text is not compared */
 constexpr size_t FARTHEST = 4;      /* edits from which on a text is not like a name */
 constexpr size_t LISTED_MAX = 40;   /* names; nobody reads more */
+constexpr size_t MEANT_MAX = 3;     /* names that one text may stand for */
+
+/* Data types of other languages, in small letters, and what they are here. */
+struct foreign_type {
+    std::string_view name;
+    std::array<std::string_view, 2> here;
+};
+constexpr foreign_type foreign_types[] = {
+    {"bool", {"UInt32", "Int32"}},
+    {"boolean", {"UInt32", "Int32"}},
+    {"byte", {"Binary"}},
+    {"bytes", {"Binary"}},
+    {"char", {"String"}},
+    {"double", {"Float64"}},
+    {"float", {"Float32"}},
+    {"int", {"Int32"}},
+    {"integer", {"Int32"}},
+    {"long", {"Int64"}},
+    {"short", {"Int32"}},
+    {"text", {"String"}},
+    {"uint", {"UInt32"}},
+    {"unsigned", {"UInt32"}},
+};
 
 /* The edits between two texts: letters added, dropped, replaced or swapped with a neighbour; case does not count. At
  * most the limit. Only the diagonal band below the limit is computed, since a source may have very many names. */
@@ -63,9 +86,8 @@ bool is_refused(std::string_view type, bool element) {
     return type == "SBS" || (element && (type == "SD" || type == "SDArray"));
 }
 
-} // namespace
-
-guess meant_by(std::string_view text, const name_list &names) {
+/* The near miss, or an empty guess. */
+guess near_guess(std::string_view text, const name_list &names) {
     if (text.size() > LONGEST_NAME)
         return {};
     std::string_view best;
@@ -79,20 +101,61 @@ guess meant_by(std::string_view text, const name_list &names) {
             best = {}; /* as near as the one before */
         }
     }
-    return {best, !best.empty() && least <= 1};
+    if (best.empty())
+        return {};
+    return {{best}, least <= 1 ? likeness::one_edit : likeness::few_edits};
 }
+
+/* The data type of arrays of a type. */
+std::string_view array_of(std::string_view type) {
+    for (std::string_view each : named_types())
+        if (each.starts_with(type) && each.substr(type.size()) == "Array")
+            return each;
+    return {};
+}
+
+/* "int", "IntArray" and "int[]" */
+guess foreign_guess(std::string_view text) {
+    std::string small(text);
+    std::transform(small.begin(), small.end(), small.begin(), lower);
+    std::string_view type = small;
+    for (std::string_view suffix : {"array", "[]"})
+        if (type.ends_with(suffix))
+            type.remove_suffix(suffix.size());
+    guess meant;
+    for (const foreign_type &each : foreign_types)
+        for (std::string_view here : each.here)
+            if (each.name == type && !here.empty())
+                meant.names.push_back(type.size() < small.size() ? array_of(here) : here);
+    return meant;
+}
+
+} // namespace
 
 std::string_view near_miss(std::string_view text, const name_list &names) {
-    return meant_by(text, names).name;
+    return near_guess(text, names).name();
 }
 
-std::string suggestion(std::string_view text, const name_list &names) {
-    std::string_view meant = near_miss(text, names);
-    if (!meant.empty())
-        return "did you mean " + quoted(meant) + "?";
+guess meant_by(std::string_view text, const name_list &names) {
+    guess meant = near_guess(text, names);
+    if (!meant.names.empty())
+        return meant;
+    meant.names = names_with_part(text, names);
+    if (meant.names.size() > MEANT_MAX)
+        meant.names.clear();
+    return meant;
+}
+
+std::string suggestion(const guess &meant, const name_list &names) {
+    if (!meant.names.empty())
+        return "did you mean " + listed(meant.names, "or") + "?";
     if (names.empty() || names.size() > LISTED_MAX)
         return {};
     return "known are " + listed(names);
+}
+
+std::string suggestion(std::string_view text, const name_list &names) {
+    return suggestion(meant_by(text, names), names);
 }
 
 name_list data_type_names(bool element) {
@@ -102,14 +165,18 @@ name_list data_type_names(bool element) {
 }
 
 guess type_meant_by(std::string_view text, bool element) {
-    guess meant = meant_by(text, named_types());
-    return is_refused(meant.name, element) ? guess() : meant;
+    guess meant = near_guess(text, named_types());
+    if (is_refused(meant.name(), element))
+        return {};
+    if (meant.names.empty())
+        meant = foreign_guess(text);
+    return meant.names.empty() ? meant_by(text, data_type_names(element)) : meant;
 }
 
 std::string type_suggestion(std::string_view text, bool element) {
     std::string_view meant = near_miss(text, named_types());
     if (meant.empty() || !is_refused(meant, element))
-        return suggestion(text, data_type_names(element));
+        return suggestion(type_meant_by(text, element), data_type_names(element));
     if (meant == "SBS")
         return quoted(meant) + " is not supported";
     return "an element cannot be of type " + quoted(meant);
@@ -124,10 +191,11 @@ std::string quoted(std::string_view text) {
     return whole.append("`").append(text).append("`");
 }
 
-std::string listed(const name_list &names) {
+std::string listed(const name_list &names, const char *last) {
     std::string text;
     for (size_t i = 0; i < names.size(); ++i) {
-        text += i == 0 ? "" : i + 1 < names.size() ? ", " : " and ";
+        if (i > 0)
+            text += i + 1 < names.size() ? ", " : " " + std::string(last) + " ";
         text += quoted(names[i]);
     }
     return text;

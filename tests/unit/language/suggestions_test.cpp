@@ -51,6 +51,32 @@ TEST(Suggestion, ListsFortyNamesAtMost) {
     EXPECT_EQ(suggestion("Colour", language::name_list(41, "Id")), "");
 }
 
+TEST(Suggestion, NamesWhatTheTextIsAPartOf) {
+    EXPECT_EQ(suggestion("Type", {"Name", "DataType"}), "did you mean `DataType`?");
+    EXPECT_EQ(suggestion("Interval", {"OneInterval", "NewInterval", "Id"}),
+              "did you mean `OneInterval` or `NewInterval`?");
+    EXPECT_EQ(suggestion("Key", {"AKey", "BKey", "CKey"}), "did you mean `AKey`, `BKey` or `CKey`?");
+    EXPECT_EQ(suggestion("Key", {"AKey", "BKey", "CKey", "DKey"}), "known are `AKey`, `BKey`, `CKey` and `DKey`");
+}
+
+TEST(MeantBy, IsCertainOfOneEditOnly) {
+    EXPECT_TRUE(language::meant_by("datatype", {"DataType"}).is_certain());
+    EXPECT_TRUE(language::meant_by("DtaType", {"DataType"}).is_certain());
+    EXPECT_FALSE(language::meant_by("DtaTpe", {"DataType"}).is_certain());
+    EXPECT_EQ(language::meant_by("DtaTpe", {"DataType"}).name(), "DataType");
+    EXPECT_FALSE(language::meant_by("Type", {"DataType"}).is_certain());
+    EXPECT_FALSE(language::meant_by("Ib", {"Id", "If"}).is_certain());
+}
+
+TEST(TypeSuggestion, KnowsTypesOfOtherLanguages) {
+    EXPECT_EQ(language::type_suggestion("int", false), "did you mean `Int32`?");
+    EXPECT_EQ(language::type_suggestion("Double", true), "did you mean `Float64`?");
+    EXPECT_EQ(language::type_suggestion("bool", false), "did you mean `UInt32` or `Int32`?");
+    EXPECT_EQ(language::type_suggestion("unsigned[]", false), "did you mean `UInt32Array`?");
+    EXPECT_EQ(language::type_suggestion("FloatArray", false), "did you mean `Float32Array`?");
+    EXPECT_FALSE(language::type_meant_by("int", false).is_certain());
+}
+
 TEST(TypeSuggestion, SaysWhichTypesAreNotAccepted) {
     EXPECT_EQ(language::type_suggestion("int32", true), "did you mean `Int32`?");
     EXPECT_EQ(language::type_suggestion("SBSS", false), "`SBS` is not supported");

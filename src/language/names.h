@@ -19,8 +19,8 @@ name_list attribute_names(const srtable_ctrl &kind);
 /* The stanza kinds that have an attribute of exactly this name. */
 kind_set kinds_with(std::string_view attribute);
 
-/* The attribute of a kind that a text was meant to be. Besides names that are like the text, it may be the attribute that
- * does in this kind what the text's attribute does in others: `InitialValue` is the `DefaultValue` of a persistent
+/* The attribute of a kind that a text was meant to be. Besides names that are like the text, it may be the attribute
+ * that does in this kind what the text's attribute does in others: `InitialValue` is the `DefaultValue` of a persistent
  * attribute. */
 guess attribute_meant_by(std::string_view text, const srtable_ctrl &kind);
 

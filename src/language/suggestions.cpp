@@ -30,20 +30,13 @@ struct foreign_type {
     std::array<std::string_view, 2> here;
 };
 constexpr foreign_type foreign_types[] = {
-    {"bool", {"UInt32", "Int32"}},
-    {"boolean", {"UInt32", "Int32"}},
-    {"byte", {"Binary"}},
-    {"bytes", {"Binary"}},
-    {"char", {"String"}},
-    {"double", {"Float64"}},
-    {"float", {"Float32"}},
-    {"int", {"Int32"}},
-    {"integer", {"Int32"}},
-    {"long", {"Int64"}},
-    {"short", {"Int32"}},
-    {"text", {"String"}},
-    {"uint", {"UInt32"}},
-    {"unsigned", {"UInt32"}},
+    {"bool", {"UInt32", "Int32"}}, {"boolean", {"UInt32", "Int32"}},
+    {"byte", {"Binary"}},          {"bytes", {"Binary"}},
+    {"char", {"String"}},          {"double", {"Float64"}},
+    {"float", {"Float32"}},        {"int", {"Int32"}},
+    {"integer", {"Int32"}},        {"long", {"Int64"}},
+    {"short", {"Int32"}},          {"text", {"String"}},
+    {"uint", {"UInt32"}},          {"unsigned", {"UInt32"}},
 };
 
 /* The edits between two texts: letters added, dropped, replaced or swapped with a neighbour; case does not count. At

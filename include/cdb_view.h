@@ -97,8 +97,11 @@ public:
     std::span<const std::byte> raw() const {
         return all;
     }
-    /** True if `length` bytes from `offset` on lie inside. Both are in bytes; neither can overflow. */
-    bool holds(std::size_t offset, std::size_t length) const {
+    /**
+     * True if `length` bytes from `offset` on lie inside. Both are in bytes; neither can overflow. Offsets and lengths
+     * have 64 bits on every machine, because sums of two numbers of a file do not fit into 32.
+     */
+    bool holds(std::uint64_t offset, std::uint64_t length) const {
         return offset <= all.size() && length <= all.size() - offset;
     }
 
@@ -106,10 +109,10 @@ public:
      * A number or an enumeration of the file at `offset`, in the byte order of this machine. Returns 0 if it is not
      * wholly inside. The offset needs no alignment.
      */
-    template <class Number> Number number(std::size_t offset) const {
+    template <class Number> Number number(std::uint64_t offset) const {
         std::array<std::byte, sizeof(Number)> raw_number = {};
         if (holds(offset, sizeof(Number)))
-            std::memcpy(raw_number.data(), all.data() + offset, sizeof(Number));
+            std::memcpy(raw_number.data(), at(offset), sizeof(Number));
         if (file_order != std::endian::native)
             std::reverse(raw_number.begin(), raw_number.end());
         return std::bit_cast<Number>(raw_number);
@@ -120,11 +123,11 @@ public:
      * are left as they are in the file; class value reads them. Returns a record of zeros if it is not wholly inside.
      * The offset needs no alignment.
      */
-    template <class Record> Record record(std::size_t offset) const {
+    template <class Record> Record record(std::uint64_t offset) const {
         Record copy = {};
         if (!holds(offset, sizeof copy))
             return copy;
-        std::memcpy(&copy, all.data() + offset, sizeof copy);
+        std::memcpy(&copy, at(offset), sizeof copy);
         if (file_order != std::endian::native)
             turn(reinterpret_cast<std::byte *>(&copy), fields_of<Record>);
         return copy;
@@ -134,31 +137,37 @@ public:
      * The part from `offset` on, at most `length` bytes long. Shorter if fewer bytes follow, and empty if the offset
      * lies outside.
      */
-    bytes part(std::size_t offset, std::size_t length = SIZE_MAX) const {
+    bytes part(std::uint64_t offset, std::uint64_t length = UINT64_MAX) const {
         if (offset > all.size())
             return {{}, file_order};
-        return {all.subspan(offset, std::min(length, all.size() - offset)), file_order};
+        auto room = static_cast<std::size_t>(std::min(length, all.size() - offset));
+        return {all.subspan(static_cast<std::size_t>(offset), room), file_order};
     }
 
     /**
      * The text from `offset` to its zero byte, which is not included. If there is none, the text ends with the stretch.
      * Empty if the offset lies outside. It refers to the database's bytes.
      */
-    std::string_view text(std::size_t offset) const {
+    std::string_view text(std::uint64_t offset) const {
         if (offset >= all.size())
             return {};
-        const char *start = reinterpret_cast<const char *>(all.data()) + offset;
-        const void *zero = std::memchr(start, 0, all.size() - offset);
-        return {start, zero == nullptr ? all.size() - offset
-                                       : static_cast<std::size_t>(static_cast<const char *>(zero) - start)};
+        const char *start = reinterpret_cast<const char *>(at(offset));
+        auto room = static_cast<std::size_t>(all.size() - offset);
+        const void *zero = std::memchr(start, 0, room);
+        return {start, zero == nullptr ? room : static_cast<std::size_t>(static_cast<const char *>(zero) - start)};
     }
 
     /** The text that a reference leads to, as for an offset. Empty if the reference is none. */
     std::string_view text(const cdb_ref_t &ref) const {
-        return ref.offset[0] == CDB_NONE ? std::string_view() : text(std::size_t{ref.offset[0]});
+        return ref.offset[0] == CDB_NONE ? std::string_view() : text(std::uint64_t{ref.offset[0]});
     }
 
 private:
+    /* offset: at most size(). */
+    const std::byte *at(std::uint64_t offset) const {
+        return all.data() + static_cast<std::size_t>(offset);
+    }
+
     static void turn(std::byte *record, std::span<const field> fields) {
         for (const field &f : fields) {
             std::size_t width = f.kind == field_kind::reference ? sizeof(vx_uint32_t) : f.width;
@@ -227,7 +236,7 @@ public:
     /** An empty list. */
     list_of() = default;
     /** `count` items from the byte `offset` on. What the offset counts from is for the context to say. */
-    list_of(const Context &of, std::size_t offset, std::size_t count) : context(of), first(offset), items(count) {}
+    list_of(const Context &of, std::uint64_t offset, std::size_t count) : context(of), first(offset), items(count) {}
 
     /** The number of items. */
     std::size_t size() const {
@@ -242,7 +251,7 @@ public:
      * meaningless, but reads nothing outside of the database.
      */
     Item operator[](std::size_t index) const {
-        return Item(context, first + index * Item::SIZE);
+        return Item(context, first + std::uint64_t{index} * Item::SIZE);
     }
     /** The first item. */
     list_iterator<list_of, Item> begin() const {
@@ -255,7 +264,7 @@ public:
 
 private:
     Context context = {};
-    std::size_t first = 0;
+    std::uint64_t first = 0;
     std::size_t items = 0;
 };
 
@@ -263,8 +272,8 @@ private:
  * How many of `count` items, of `size` bytes each, lie wholly inside `area` if the first begins at `offset`. `size`
  * must not be 0.
  */
-inline std::size_t count_inside(const bytes &area, std::size_t offset, std::size_t count, std::size_t size) {
-    return offset > area.size() ? 0 : std::min(count, (area.size() - offset) / size);
+inline std::size_t count_inside(const bytes &area, std::uint64_t offset, std::uint64_t count, std::size_t size) {
+    return offset > area.size() ? 0 : static_cast<std::size_t>(std::min(count, (area.size() - offset) / size));
 }
 
 /**
@@ -308,7 +317,7 @@ public:
     /** An empty list. */
     value_list() = default;
     /** `count` elements from the byte `offset` of the strings on. */
-    value_list(const value_context &of, std::size_t offset, std::size_t count)
+    value_list(const value_context &of, std::uint64_t offset, std::size_t count)
         : context(of), first(offset), items(count) {}
 
     /** The number of items. */
@@ -331,7 +340,7 @@ public:
 
 private:
     value_context context;
-    std::size_t first = 0;
+    std::uint64_t first = 0;
     std::size_t items = 0;
 };
 
@@ -344,11 +353,11 @@ public:
     /** A value that is not present. */
     value() = default;
     /** The value whose cell is at a byte offset of an area. If the cell is not wholly inside, it reads as zeros. */
-    value(const bytes &area, std::size_t offset, vx_data_type_t data_type, const bytes &class_strings,
+    value(const bytes &area, std::uint64_t offset, vx_data_type_t data_type, const bytes &class_strings,
           unsigned depth = 0)
         : cell_type(data_type), strings(class_strings), nesting(depth) {
         if (area.holds(offset, cell.size()))
-            std::memcpy(cell.data(), area.raw().data() + offset, cell.size());
+            std::memcpy(cell.data(), area.raw().data() + static_cast<std::size_t>(offset), cell.size());
     }
 
     /** The type that the record, or the element, names. In an unsound file it may be any number. */
@@ -392,7 +401,7 @@ public:
      * is the source's.
      */
     std::string_view text() const {
-        return cell_type == VX_CHAR_PTR && place() ? strings.text(std::size_t{*place()}) : std::string_view();
+        return cell_type == VX_CHAR_PTR && place() ? strings.text(std::uint64_t{*place()}) : std::string_view();
     }
     /**
      * The bytes of a `Binary`; empty for any other type, if it is not present, and if they do not all lie inside the
@@ -401,7 +410,7 @@ public:
     std::span<const std::byte> binary() const {
         if (cell_type != VX_BINARY_PTR || !place())
             return {};
-        std::size_t at = *place();
+        std::uint64_t at = *place();
         auto length = strings.number<std::uint32_t>(at);
         return strings.holds(at + BINARY_BYTES, length) ? strings.part(at + BINARY_BYTES, length).raw()
                                                         : std::span<const std::byte>();
@@ -413,7 +422,7 @@ public:
     vx_resource_handle_t handle() const {
         if (cell_type != VX_RSRC_HANDLE_PTR || !place())
             return {};
-        std::size_t at = *place();
+        std::uint64_t at = *place();
         auto word = [&](std::size_t i) { return strings.number<std::uint32_t>(at + i * sizeof(std::uint32_t)); };
         return {word(0), {word(1), word(2), word(3), word(4)}};
     }
@@ -425,7 +434,7 @@ public:
         bool structured = cell_type == VX_SD_PTR;
         if ((!structured && !is_array(cell_type)) || !place() || nesting >= NESTING_MAX)
             return {};
-        std::size_t at = *place();
+        std::uint64_t at = *place();
         std::size_t size = structured ? sizeof(vx_structured_data_element_t) : sizeof(vx_value_t);
         std::size_t count = count_inside(strings, at + ELEMENTS, strings.number<std::uint32_t>(at), size);
         return {{strings, structured ? VX_UNKNOWN : element_type(cell_type), nesting + 1}, at + ELEMENTS, count};
@@ -451,9 +460,9 @@ private:
 
 inline value value_list::operator[](std::size_t index) const {
     if (context.array_element != VX_UNKNOWN)
-        return {context.strings, first + index * sizeof(vx_value_t), context.array_element, context.strings,
-                context.nesting};
-    std::size_t at = first + index * sizeof(vx_structured_data_element_t);
+        return {context.strings, first + std::uint64_t{index} * sizeof(vx_value_t), context.array_element,
+                context.strings, context.nesting};
+    std::uint64_t at = first + std::uint64_t{index} * sizeof(vx_structured_data_element_t);
     return {context.strings, at + offsetof(vx_structured_data_element_t, value),
             context.strings.number<vx_data_type_t>(at), context.strings, context.nesting};
 }
@@ -488,7 +497,7 @@ struct variety {
     static constexpr std::size_t SIZE = sizeof(vl_entry_t);
 
     /** The entry at a byte offset of the table. */
-    variety(const bytes &variety_lists, std::size_t at)
+    variety(const bytes &variety_lists, std::uint64_t at)
         : low(variety_lists.number<std::uint32_t>(at + offsetof(vl_entry_t, vl_low_val))),
           high(variety_lists.number<std::uint32_t>(at + offsetof(vl_entry_t, vl_high_val))) {}
 
@@ -518,7 +527,7 @@ struct valid_value {
     static constexpr std::size_t SIZE = sizeof(vv_entry_t);
 
     /** The entry at a byte offset of the table. */
-    valid_value(const valid_value_context &of, std::size_t at)
+    valid_value(const valid_value_context &of, std::uint64_t at)
         : low(of.tables.valid_vals, at + offsetof(vv_entry_t, vv_low_val), of.type, of.tables.strings, NESTING_MAX),
           high(of.tables.valid_vals, at + offsetof(vv_entry_t, vv_high_val), of.type, of.tables.strings, NESTING_MAX),
           message(of.tables.valid_vals.number<std::uint16_t>(at + offsetof(vv_entry_t, vv_disp_msgid))) {}
@@ -536,10 +545,10 @@ using valid_value_list = list_of<valid_value, valid_value_context>;
 
 /** The list that a reference leads to; empty if the reference is none. */
 inline variety_list varieties_at(const class_tables &tables, const cdb_ref_t &ref) {
-    std::size_t at = ref.offset[0];
+    std::uint64_t at = ref.offset[0];
     if (ref.offset[0] == CDB_NONE)
         return {};
-    std::size_t first = at + offsetof(variety_list_t, vl_values);
+    std::uint64_t first = at + offsetof(variety_list_t, vl_values);
     auto count = tables.variety_lists.number<std::uint32_t>(at + offsetof(variety_list_t, vl_count));
     return {tables.variety_lists, first, count_inside(tables.variety_lists, first, count, variety::SIZE)};
 }
@@ -549,10 +558,10 @@ inline variety_list varieties_at(const class_tables &tables, const cdb_ref_t &re
  * element that the values are valid for.
  */
 inline valid_value_list valid_values_at(const class_tables &tables, const cdb_ref_t &ref, vx_data_type_t owner) {
-    std::size_t at = ref.offset[0];
+    std::uint64_t at = ref.offset[0];
     if (ref.offset[0] == CDB_NONE)
         return {};
-    std::size_t first = at + offsetof(valid_values_t, vv_values);
+    std::uint64_t first = at + offsetof(valid_values_t, vv_values);
     auto count = tables.valid_vals.number<std::uint32_t>(at + offsetof(valid_values_t, vv_count));
     return {{tables, element_type(owner)}, first, count_inside(tables.valid_vals, first, count, valid_value::SIZE)};
 }
@@ -564,7 +573,7 @@ public:
     static constexpr std::size_t SIZE = sizeof(sd_field_t);
 
     /** The element at a byte offset of the table. */
-    sd_element(const class_tables &of, std::size_t at) : tables(of), fields(of.sd_defs.record<sd_field_t>(at)) {}
+    sd_element(const class_tables &of, std::uint64_t at) : tables(of), fields(of.sd_defs.record<sd_field_t>(at)) {}
 
     /** The element's record as in cdb.h, in the byte order of this machine. It is valid as long as this object. */
     const sd_field_t &record() const {
@@ -593,10 +602,10 @@ using sd_definition = list_of<sd_element, class_tables>;
 
 /** The definition that a reference leads to; empty if the reference is none. */
 inline sd_definition sd_definition_at(const class_tables &tables, const cdb_ref_t &ref) {
-    std::size_t at = ref.offset[0];
+    std::uint64_t at = ref.offset[0];
     if (ref.offset[0] == CDB_NONE)
         return {};
-    std::size_t first = at + offsetof(sd_def_t, sd_fields);
+    std::uint64_t first = at + offsetof(sd_def_t, sd_fields);
     auto count = tables.sd_defs.number<std::uint32_t>(at + offsetof(sd_def_t, sd_count));
     return {tables, first, count_inside(tables.sd_defs, first, count, sd_element::SIZE)};
 }
@@ -611,7 +620,7 @@ public:
     static constexpr std::size_t SIZE = sizeof(Record);
 
     /** The attribute at a byte offset of the class section. */
-    attribute(const class_tables &of, std::size_t offset)
+    attribute(const class_tables &of, std::uint64_t offset)
         : tables(of), at(offset), fields(of.section.record<Record>(offset)) {}
 
     /**
@@ -684,7 +693,7 @@ private:
     }
 
     class_tables tables;
-    std::size_t at; /**< in the section */
+    std::uint64_t at; /**< in the section */
     Record fields;
 };
 
@@ -700,7 +709,7 @@ public:
     static constexpr std::size_t SIZE = sizeof(rsrc_action_t);
 
     /** The action at a byte offset of the class section. */
-    action(const class_tables &of, std::size_t at) : tables(of), fields(of.section.record<rsrc_action_t>(at)) {}
+    action(const class_tables &of, std::uint64_t at) : tables(of), fields(of.section.record<rsrc_action_t>(at)) {}
 
     /**
      * The action's record as in cdb.h, in the byte order of this machine: message numbers, properties, permissions,
@@ -748,8 +757,8 @@ public:
 
     /** The class whose section these bytes are. database::classes() makes them. */
     explicit resource_class(const bytes &section) : fields(section.record<rsrc_class_t>(0)) {
-        auto table = [&](const cdb_ref_t &ref, std::size_t size) { return section.part(ref.offset[0], size); };
-        tables = {section, table(fields.u_rc_strings, SIZE_MAX), table(fields.u_rc_valid_vals, fields.rc_valval_size),
+        auto table = [&](const cdb_ref_t &ref, std::uint64_t size) { return section.part(ref.offset[0], size); };
+        tables = {section, table(fields.u_rc_strings, UINT64_MAX), table(fields.u_rc_valid_vals, fields.rc_valval_size),
                   table(fields.u_rc_variety_lists, fields.rc_varlist_size),
                   table(fields.u_rc_sd_defs, fields.rc_sd_size)};
     }
@@ -795,7 +804,7 @@ public:
 
 private:
     template <class Item> list_of<Item, class_tables> records(const cdb_ref_t &ref, std::size_t count) const {
-        std::size_t first = ref.offset[0];
+        std::uint64_t first = ref.offset[0];
         return {tables, first, count_inside(tables.section, first, count, Item::SIZE)};
     }
 
@@ -869,7 +878,7 @@ struct variable_id {
     static constexpr std::size_t SIZE = sizeof(var_id_t);
 
     /** The entry at a byte offset of the section. */
-    variable_id(const bytes &section, std::size_t at) : number(section.number<var_id_t>(at)) {}
+    variable_id(const bytes &section, std::uint64_t at) : number(section.number<var_id_t>(at)) {}
 
     /** True for an attribute of the class itself, false for one of its resources. */
     bool of_class() const {
@@ -911,7 +920,7 @@ public:
     }
     /** The dynamic attributes that belong to it: those of the class first, then those of its resources. */
     list_of<variable_id, bytes> variable_ids() const {
-        std::size_t first = sizeof fields + std::size_t{fields.u_rvc_string_tbl.offset[0]};
+        std::uint64_t first = sizeof fields + std::uint64_t{fields.u_rvc_string_tbl.offset[0]};
         return {section, first, count_inside(section, first, fields.rvc_var_count, variable_id::SIZE)};
     }
 
@@ -973,7 +982,7 @@ public:
     }
     /** The anchor of a section, in the byte order of this machine. `index` must be less than section_count(). */
     cdb_dsect_anchor_t anchor(std::size_t index) const {
-        return all.record<cdb_dsect_anchor_t>(sizeof head + index * sizeof(cdb_dsect_anchor_t));
+        return all.record<cdb_dsect_anchor_t>(sizeof head + std::uint64_t{index} * sizeof(cdb_dsect_anchor_t));
     }
     /**
      * The bytes of a section. Shorter than its anchor says, or empty, if they are not all inside the file. `index` must

@@ -23,7 +23,7 @@ size_t used_bytes(const cdb_ref_t &table) {
 /* ---- Sizes ----------------------------------------------------------------------------------------------------- */
 
 /* Offsets and sizes in the file have 32 bits. */
-vx_uint32_t checked_size(size_t bytes) {
+vx_uint32_t checked_size(vx_uint64_t bytes) {
     if (bytes > std::numeric_limits<vx_uint32_t>::max())
         bld_error_exit(MSG_TABLE_TOO_LARGE, nullptr, nullptr, 1);
     return static_cast<vx_uint32_t>(bytes);
@@ -43,8 +43,8 @@ size_t strings_size(const cdb_ref_t &strings) {
 
 /* Notes the counts and sizes of a class's tables in its record, and returns the size of its section. Errors,
  * dependencies and structured byte strings are deliberately not counted. */
-size_t class_size(rsrc_class_t &rc) {
-    size_t size = sizeof rc;
+vx_uint64_t class_size(rsrc_class_t &rc) {
+    vx_uint64_t size = sizeof rc;
     for (const cdb::side_table &table : cdb::side_tables_as_counted) {
         if (table.count != nullptr)
             rc.*table.count = checked_count(rc.*table.ref, table.record->size);
@@ -227,7 +227,8 @@ void write_header(cdgen &cx) {
 } // namespace
 
 size_t cdb_size(cdgen &cx) {
-    size_t size = sizeof(orb_cdb_header_t) + sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.image.dsect_count);
+    vx_uint64_t size =
+        sizeof(orb_cdb_header_t) + sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.image.dsect_count);
     for (const auto &vc : records_of<rsrc_variable_class_t>(&cx.sections.rsrc_var_class_tbl))
         size += sizeof vc + strings_size(vc.u_rvc_string_tbl) + round8(sizeof(var_id_t) * vc.rvc_var_count);
     for (const auto &map : records_of<rsrc_cmmap_t>(&cx.sections.rsrc_cmmap_tbl))

@@ -80,8 +80,8 @@ struct side_table {
     std::string_view stanza = {}; /* of a record */
 
     /* The size of the table in bytes, as the class record says it; 0 for the strings, which say none. */
-    constexpr std::size_t size_in(const rsrc_class_t &rc) const {
-        return count != nullptr ? std::size_t{rc.*count} * record->size : bytes != nullptr ? rc.*bytes : 0;
+    constexpr std::uint64_t size_in(const rsrc_class_t &rc) const {
+        return count != nullptr ? std::uint64_t{rc.*count} * record->size : bytes != nullptr ? rc.*bytes : 0;
     }
 };
 

@@ -21,7 +21,7 @@ public:
 
 private:
     void check_tables();
-    void check_end(std::size_t strings_at);
+    void check_end(std::uint64_t strings_at);
     void walk_attributes();
     void walk_actions(const cdb_ref_t &table, std::size_t count, vx_uint32_t id);
     void walk_errors();
@@ -45,7 +45,7 @@ const field &ref_field(const side_table &table) {
 
 /* Tables follow each other without gaps. */
 void class_walk::check_tables() {
-    std::size_t end = sizeof rc;
+    std::uint64_t end = sizeof rc;
     for (const side_table &table : side_tables) {
         std::size_t offset = (rc.*table.ref).offset[0];
         bool unlocated = table.form == table_form::UNLOCATED && offset == 0;
@@ -63,7 +63,7 @@ void class_walk::check_tables() {
 }
 
 /* The strings end the section. strings_at: where they start. */
-void class_walk::check_end(std::size_t strings_at) {
+void class_walk::check_end(std::uint64_t strings_at) {
     if ((section.size() - strings_at) % extent::UNIT != 0)
         out.report(check::SECTION_LENGTH, at, field_of<rsrc_class_t>(offsetof(rsrc_class_t, u_rc_strings)),
                    std::to_string(section.size() - strings_at) + " bytes of strings", "a multiple of 8");

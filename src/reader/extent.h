@@ -46,6 +46,9 @@ public:
     static constexpr std::size_t units(std::size_t size) {
         return (size + UNIT - 1) / UNIT;
     }
+    static constexpr std::size_t rounded(std::size_t size) {
+        return units(size) * UNIT;
+    }
 
     bytes area;
     std::size_t offset;    /* of the area in the file */

@@ -40,23 +40,26 @@ void walk_map(reporter &out, const location &at, const bytes &section) {
 }
 
 /* The IDs, filled up to a multiple of 8, end the section. first: where they start. */
-static void walk_variable_ids(reporter &out, const location &record_at, const bytes &section, std::size_t first,
-                              std::size_t count, std::span<const var_id_t> dynamic_ids) {
-    std::size_t length = extent::units(count * sizeof(var_id_t)) * extent::UNIT;
-    if (first + length != section.size())
+static void walk_variable_ids(reporter &out, const location &record_at, const bytes &section, std::uint64_t first,
+                              std::uint64_t told, std::span<const var_id_t> dynamic_ids) {
+    std::uint64_t filled = (told * sizeof(var_id_t) + extent::UNIT - 1) / extent::UNIT * extent::UNIT;
+    if (first + filled != section.size())
         out.report(check::SECTION_LENGTH, record_at,
                    field_of<rsrc_variable_class_t>(offsetof(rsrc_variable_class_t, rvc_var_count)), section.size(),
-                   first + length);
-    count = count_inside(section, first, count, sizeof(var_id_t));
-    location at = {record_at.section, "var_id_t", 0, record_at.offset + first};
+                   first + filled);
+    if (first > section.size())
+        return;
+    std::size_t start = static_cast<std::size_t>(first);
+    std::size_t count = count_inside(section, first, told, sizeof(var_id_t));
+    location at = {record_at.section, "var_id_t", 0, record_at.offset + start};
     for (; at.index < count; ++at.index, at.offset += sizeof(var_id_t)) {
         out.add_region(at, at.offset, sizeof(var_id_t), at.record);
-        auto id = section.number<var_id_t>(first + at.index * sizeof(var_id_t));
+        auto id = section.number<var_id_t>(at.offset - record_at.offset);
         if (!std::binary_search(dynamic_ids.begin(), dynamic_ids.end(), id))
             out.report(check::VARIABLE_ID, at, {}, at.offset, std::to_string(id), "the ID of a dynamic attribute");
     }
-    std::size_t end = first + count * sizeof(var_id_t);
-    std::size_t filling = std::min(section.size(), first + length) - std::min(section.size(), end);
+    std::size_t end = at.offset - record_at.offset;
+    std::size_t filling = static_cast<std::size_t>(std::min<std::uint64_t>(section.size(), first + filled)) - end;
     out.expect_zero(at, "filling", section, end, filling, at.offset);
     out.add_region(at, at.offset, filling, "filling");
 }
@@ -77,19 +80,20 @@ void walk_variable_class(reporter &out, const location &at, const bytes &section
         out.report(check::REFERENCE_UNALIGNED, at,
                    field_of<rsrc_variable_class_t>(offsetof(rsrc_variable_class_t, u_rvc_string_tbl)),
                    std::to_string(strings_size), "a multiple of 8");
-    walk_variable_ids(out, at, section, sizeof record + strings_size, record.rvc_var_count, dynamic_ids);
+    walk_variable_ids(out, at, section, sizeof record + std::uint64_t{strings_size}, record.rvc_var_count, dynamic_ids);
 }
 
 void walk_class_hash(reporter &out, const location &at, const bytes &section) {
     constexpr std::size_t BLOCKS = offsetof(rsrc_class_hash_t, rc_hash_blocks);
     out.visit<rsrc_class_hash_t>(at, section, 0);
-    std::size_t count = section.number<std::uint32_t>(offsetof(rsrc_class_hash_t, rch_num_hash_blocks));
-    if (BLOCKS + count * sizeof(rc_hash_block_t) != section.size())
+    std::uint64_t told = section.number<std::uint32_t>(offsetof(rsrc_class_hash_t, rch_num_hash_blocks));
+    std::uint64_t size = BLOCKS + told * sizeof(rc_hash_block_t);
+    if (size != section.size())
         out.report(check::SECTION_LENGTH, at,
-                   field_of<rsrc_class_hash_t>(offsetof(rsrc_class_hash_t, rch_num_hash_blocks)), section.size(),
-                   BLOCKS + count * sizeof(rc_hash_block_t));
+                   field_of<rsrc_class_hash_t>(offsetof(rsrc_class_hash_t, rch_num_hash_blocks)), section.size(), size);
     location block = {at.section, "rc_hash_block_t", 0, at.offset + BLOCKS};
-    for (count = count_inside(section, BLOCKS, count, sizeof(rc_hash_block_t)); block.index < count; ++block.index) {
+    for (std::size_t count = count_inside(section, BLOCKS, told, sizeof(rc_hash_block_t)); block.index < count;
+         ++block.index) {
         out.visit<rc_hash_block_t>(block, section, block.offset - at.offset);
         block.offset += sizeof(rc_hash_block_t);
     }

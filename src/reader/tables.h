@@ -12,8 +12,8 @@ class_tables tables_of(const database &db, std::size_t section);
 
 /* How many records of a table are inside the class section; size: of a record. At 0 is the class record: a table whose
  * reference is 0 has no place, and nothing is known of it but its count. */
-inline std::size_t count_placed(const bytes &section, const cdb_ref_t &table, std::size_t count, std::size_t size) {
-    std::size_t at = table.offset[0];
+inline std::size_t count_placed(const bytes &section, const cdb_ref_t &table, std::uint64_t count, std::size_t size) {
+    std::uint64_t at = table.offset[0];
     return at == 0 ? 0 : count_inside(section, at, count, size);
 }
 

@@ -48,7 +48,7 @@ void text_walk::claim(std::size_t start, std::size_t end) {
     if (!whole)
         return out.report(check::VALUE_SHARED, text, {}, text.offset, "a text that runs into something else",
                           "a place of its own");
-    std::size_t filled = std::min(end, extent::units(start + size) * extent::UNIT);
+    std::size_t filled = std::min(end, extent::rounded(start + size));
     std::size_t filling = filled - start - size;
     out.expect_zero(text, "filling", strings.area, start + size, filling, text.offset + size);
     out.add_region(text, text.offset + size, filling, "filling");

@@ -33,14 +33,14 @@ void value_walk::walk(const cell_location &cell, std::uint32_t offset, vx_data_t
 }
 
 /* Claims length bytes from offset on. False, and reported, if they lie outside or belong to another value. */
-bool value_walk::claim(const cell_location &cell, std::size_t offset, std::size_t length) {
+bool value_walk::claim(const cell_location &cell, std::size_t offset, std::uint64_t length) {
     if (!strings.area.holds(offset, length)) {
         out.report(check::VALUE_OUTSIDE, cell.record, cell.field, cell.offset,
                    std::to_string(offset) + " + " + std::to_string(length),
                    "at most " + std::to_string(strings.area.size()));
         return false;
     }
-    if (strings.claim(offset, length) == extent::claim_result::FIRST)
+    if (strings.claim(offset, static_cast<std::size_t>(length)) == extent::claim_result::FIRST)
         return true;
     out.report(check::VALUE_SHARED, cell.record, cell.field, cell.offset, std::to_string(offset), "a value of its own");
     found_shared = true;
@@ -57,15 +57,15 @@ void value_walk::walk_text(const cell_location &cell, std::size_t offset) {
 
 /* From end to the next multiple of 8, in the strings. */
 void value_walk::walk_filling(const location &place, std::size_t end) {
-    std::size_t rounded = std::min(extent::units(end) * extent::UNIT, strings.area.size());
+    std::size_t rounded = std::min(extent::rounded(end), strings.area.size());
     out.expect_zero(place, "filling", strings.area, end, rounded - end, strings.offset + end);
     out.add_region(place, strings.offset + end, rounded - end, "filling");
 }
 
 /* The length and the bytes are two pieces. */
 void value_walk::walk_binary(const cell_location &cell, std::size_t offset) {
-    std::size_t length = strings.area.number<std::uint32_t>(offset);
-    if (!claim(cell, offset, value::BINARY_BYTES + length))
+    auto length = strings.area.number<std::uint32_t>(offset);
+    if (!claim(cell, offset, value::BINARY_BYTES + std::uint64_t{length}))
         return;
     location binary = {section, "binary", 0, strings.offset + offset};
     out.add_region(binary, binary.offset, sizeof(vx_uint32_t), "length");
@@ -95,8 +95,8 @@ void value_walk::walk_handle(const cell_location &cell, std::size_t offset) {
 }
 
 void value_walk::walk_array(const cell_location &cell, std::size_t offset, vx_data_type_t type) {
-    std::size_t count = strings.area.number<std::uint32_t>(offset);
-    if (!claim(cell, offset, value::ELEMENTS + count * sizeof(vx_value_t)))
+    auto count = strings.area.number<std::uint32_t>(offset);
+    if (!claim(cell, offset, value::ELEMENTS + std::uint64_t{count} * sizeof(vx_value_t)))
         return;
     location array = {section, "vx_array_t", 0, strings.offset + offset};
     out.visit<vx_array_t>(array, strings.area, offset);
@@ -122,8 +122,8 @@ void value_walk::walk_element(const location &element, std::uint32_t offset, vx_
 void value_walk::walk_structured_data(const cell_location &cell, std::size_t offset) {
     constexpr std::size_t SIZE = sizeof(vx_structured_data_element_t);
     constexpr std::size_t VALUE = offsetof(vx_structured_data_element_t, value);
-    std::size_t count = strings.area.number<std::uint32_t>(offset);
-    if (!claim(cell, offset, value::ELEMENTS + std::max<std::size_t>(count, 1) * SIZE))
+    auto count = strings.area.number<std::uint32_t>(offset);
+    if (!claim(cell, offset, value::ELEMENTS + std::max<std::uint64_t>(count, 1) * SIZE))
         return;
     location sd = {section, "vx_structured_data_t", 0, strings.offset + offset};
     out.visit<vx_structured_data_t>(sd, strings.area, offset);

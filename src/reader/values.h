@@ -28,7 +28,7 @@ public:
     bool found_shared = false; /* a value that another record had claimed; whoever asks resets it */
 
 private:
-    bool claim(const cell_location &cell, std::size_t offset, std::size_t length);
+    bool claim(const cell_location &cell, std::size_t offset, std::uint64_t length);
     void walk_text(const cell_location &cell, std::size_t offset);
     void walk_binary(const cell_location &cell, std::size_t offset);
     void walk_handle(const cell_location &cell, std::size_t offset);

@@ -8,6 +8,7 @@
 #include <cstdio>
 #include <filesystem>
 #include <memory>
+#include <new>
 #include <sys/mman.h>
 
 namespace cdb {
@@ -47,12 +48,15 @@ void advise_large_pages([[maybe_unused]] std::byte *start, [[maybe_unused]] std:
 
 /* Reads until the end of the file, whatever its size was said to be; with the right size, no byte is moved. The steps
  * are small so that their new bytes, zero at first, are still in the nearest cache when they are read into. */
-std::vector<std::byte> read_all(std::FILE *file, std::size_t expected) {
+std::vector<std::byte> read_all(std::FILE *file, std::uintmax_t expected) {
     std::vector<std::byte> contents;
-    contents.reserve(expected + STEP);
+    const std::size_t most = contents.max_size() - STEP;
+    contents.reserve(static_cast<std::size_t>(std::min<std::uintmax_t>(expected, most)) + STEP);
     advise_large_pages(contents.data(), contents.capacity());
     for (;;) {
         std::size_t size = contents.size();
+        if (size > most) /* of 32 bits: a file of 2 GB and more */
+            throw std::bad_alloc();
         contents.resize(size + STEP);
         std::size_t got = std::fread(contents.data() + size, 1, STEP, file);
         if (got < STEP) {
@@ -85,7 +89,7 @@ std::vector<std::byte> read_file(const char *path, std::error_code &error) {
     }
     std::error_code unknown;
     auto told = std::filesystem::file_size(path, unknown);
-    std::vector<std::byte> contents = read_all(file.get(), unknown ? 0 : static_cast<std::size_t>(told));
+    std::vector<std::byte> contents = read_all(file.get(), unknown ? 0 : told);
     if (std::ferror(file.get()) != 0) {
         error = system_error();
         contents.clear();

@@ -285,6 +285,22 @@ TEST(CdbViewBytes, OutsideEverythingIsZero) {
     EXPECT_EQ(all.text(cdb_ref_t{{CDB_NONE, 0}}), "");
 }
 
+/* In 32 bits, these offsets are 4 bytes into the table once 8 are added. */
+TEST(CdbViewBytes, OffsetsDoNotStartAgainBeyond32Bits) {
+    std::vector<std::byte> table(64, std::byte{2});
+    cdb::bytes all(table, std::endian::native);
+    cdb::class_tables tables = {all, all, all, all, all};
+    cdb_ref_t nowhere = {{0xFFFFFFFC, 0}};
+    EXPECT_TRUE(cdb::varieties_at(tables, nowhere).empty());
+    EXPECT_TRUE(cdb::valid_values_at(tables, nowhere, VX_INT32).empty());
+    EXPECT_TRUE(cdb::sd_definition_at(tables, nowhere).empty());
+    EXPECT_EQ(all.number<std::uint32_t>(0x100000000), 0U);
+    EXPECT_EQ(all.part(0x100000000).size(), 0U);
+    EXPECT_EQ(all.part(0, 0x100000004).size(), 64U);
+    EXPECT_FALSE(all.holds(0x100000000, 0x100000000));
+    EXPECT_EQ(cdb::count_inside(all, 0, 0x100000000, 8), 8U);
+}
+
 /* ---- Reading files --------------------------------------------------------------------------------------------- */
 
 TEST(CdbViewReadFile, WholeContents) {

@@ -6,6 +6,7 @@
 
 #include <cstddef>
 #include <functional>
+#include <limits>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -46,8 +47,10 @@ private:
         unsigned position; /* in entries, from 1; 0 is free */
     };
 
+    /* The highest 32 bits of the hash, which on a 32-bit machine are all. */
     static unsigned tag_of(std::string_view text) {
-        return static_cast<unsigned>(std::hash<std::string_view>()(text) >> 32);
+        constexpr int LOWER = std::numeric_limits<size_t>::digits - std::numeric_limits<unsigned>::digits;
+        return static_cast<unsigned>(std::hash<std::string_view>()(text) >> LOWER);
     }
     static std::string_view text_of_number(const vx_uint32_t &number) {
         return {reinterpret_cast<const char *>(&number), sizeof number};

@@ -179,7 +179,7 @@ void bad_value(noting &n) {
 
 bool is_expected_index(const view &see) {
     std::string text(see.value());
-    return std::strtol(text.c_str(), nullptr, 10) == see.compiler.expected_index();
+    return std::strtoll(text.c_str(), nullptr, 10) == see.compiler.expected_index();
 }
 
 std::string expected_index(const view &see) {

@@ -27,7 +27,7 @@ void number::convert(int base) {
     std::string copy(text);
     errno = 0;
     char *stop = nullptr;
-    value = std::strtol(copy.c_str(), &stop, base);
+    value = std::strtoll(copy.c_str(), &stop, base);
     overflow = errno == ERANGE;
     read = static_cast<size_t>(stop - copy.c_str());
 }

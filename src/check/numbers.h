@@ -10,7 +10,7 @@
 
 namespace check {
 
-/* A decimal integer, or with base 0 also an octal or a hexadecimal one; what strtol makes of a text. */
+/* A decimal integer, or with base 0 also an octal or a hexadecimal one; what strtoll makes of a text. */
 struct number {
     number(std::string_view given, int base);
 
@@ -18,7 +18,7 @@ struct number {
     std::string_view rest() const;
 
     std::string_view text;
-    long value = 0;
+    vx_int64_t value = 0;
     size_t read = 0; /* characters; 0: the text does not begin with a number */
     bool overflow = false;
 

@@ -29,7 +29,7 @@ template <class Value> void store(char *to, Value value) {
     memcpy(to, &value, sizeof value);
 }
 
-long integer(const attr_line &line, const char *text) {
+vx_int64_t integer(const attr_line &line, const char *text) {
     return int_from_text(line.cx, text, nullptr, 0);
 }
 

@@ -78,8 +78,8 @@ template <class Float> bool plain_fraction(const char *text, Float *value) {
     return rounded_once && *p == '\0' && n <= EXACT && digits <= EXACT_POWER;
 }
 
-[[gnu::noinline]] long library_integer(cdgen &cx, const char *text, char **end, int base) {
-    return converted(cx, [&] { return strtol(text, end, base); });
+[[gnu::noinline]] vx_int64_t library_integer(cdgen &cx, const char *text, char **end, int base) {
+    return converted(cx, [&] { return strtoll(text, end, base); });
 }
 
 /* The whole text as a decimal integer: false when anything else follows. */
@@ -214,11 +214,11 @@ int hex_digit(char c) {
 
 /* The number after a backslash, of at most three characters, which *p is moved over. -1 if there is none. Blanks and a
  * sign count as characters of it. */
-long octal_escape(cdgen &cx, const char **p) {
+vx_int64_t octal_escape(cdgen &cx, const char **p) {
     char digits[4] = {};
     strncpy(digits, *p, 3);
     char *end = nullptr;
-    long value = int_from_text(cx, digits, &end, 8);
+    vx_int64_t value = int_from_text(cx, digits, &end, 8);
     *p += end - digits;
     return end == digits ? 256 : value;
 }
@@ -245,7 +245,7 @@ int strToVar(const char *s, orb_variable_type_t *t) {
     return 1;
 }
 
-long int_from_text(cdgen &cx, const char *text, char **end, int base) {
+vx_int64_t int_from_text(cdgen &cx, const char *text, char **end, int base) {
     vx_uint64_t plain = 0;
     bool decimal = base == 10 || (base == 0 && (text[0] != '0' || text[1] == '\0'));
     const char *after = decimal ? plain_decimal(text, &plain) : nullptr;
@@ -253,7 +253,7 @@ long int_from_text(cdgen &cx, const char *text, char **end, int base) {
         return library_integer(cx, text, end, base);
     if (end != nullptr)
         *end = const_cast<char *>(after);
-    return static_cast<long>(plain);
+    return static_cast<vx_int64_t>(plain);
 }
 
 int str_to_vx(cdgen &cx, vx_value_t *vx_out, vx_data_type_t vx_type, const char *str_in, text_pool &pool) {
@@ -289,7 +289,7 @@ int oct_convert(cdgen &cx, const char *p, int type, char *out_buf) {
             p += 2;
         } else {
             ++p;
-            long value = octal_escape(cx, &p);
+            vx_int64_t value = octal_escape(cx, &p);
             if (value > 255)
                 return -1;
             *out++ = static_cast<char>(value);
@@ -335,7 +335,7 @@ int ver_str_convert(cdgen &cx, const char *ver_str, vx_uint32_t *n) {
     vx_uint32_t component[4] = {};
     const char *p = ver_str;
     for (vx_uint32_t &value : component) {
-        value = static_cast<vx_uint32_t>(converted(cx, [&] { return strtoul(p, nullptr, 10); }));
+        value = static_cast<vx_uint32_t>(converted(cx, [&] { return strtoull(p, nullptr, 10); }));
         p = strchr(p, '.');
         if (p == nullptr)
             break;

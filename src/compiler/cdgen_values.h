@@ -24,8 +24,9 @@ vx_data_type_t strToVxDt(const char *s);
 /* 0 and the code of a variable type's name, or 1 with *t left alone. */
 int strToVar(const char *s, orb_variable_type_t *t);
 
-/* Integers by the rules of the C library, base 0, 8 or 10. An overflow is remembered in cx.conv_errno. */
-long int_from_text(cdgen &cx, const char *text, char **end, int base);
+/* Integers of 64 bits, on every machine, by the rules of the C library, base 0, 8 or 10. An overflow is remembered in
+ * cx.conv_errno. */
+vx_int64_t int_from_text(cdgen &cx, const char *text, char **end, int base);
 
 /* Converts text into *vx_out, for an array type into one element; 0, or -1 if the text is not a value of the type.
  * Texts and binaries are stored in the pool. */

@@ -34,7 +34,7 @@ private:
         auto byte = [&](std::size_t at) { return std::uint64_t{static_cast<unsigned char>(name[at])}; };
         std::size_t size = name.size();
         std::uint64_t key = byte(0) | byte((size - 1) / 2) << 8 | byte(size - 1) << 16 | std::uint64_t{size} << 24;
-        return (key * multiplier) >> (64 - SLOT_BITS);
+        return static_cast<std::size_t>((key * multiplier) >> (64 - SLOT_BITS));
     }
 
     template <class NameOf> consteval bool fill(std::size_t count, NameOf name_of) {

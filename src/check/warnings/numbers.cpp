@@ -136,7 +136,7 @@ public:
 private:
     void look_at_bits(const view &see, const number_part &part, int bits) {
         check::number n(part.text, 0);
-        long limit = (1L << bits) - 1;
+        vx_int64_t limit = (vx_int64_t{1} << bits) - 1;
         if (n.overflow || n.value < 0 || n.value > limit)
             report(see, place_of(see, part),
                    "does not fit " + std::to_string(bits) + " bits: it is stored as " +

@@ -254,7 +254,7 @@ TEST(OverflowMark, IsNotWhatOtherCallsLeaveInErrno) {
 struct plain_row {
     const char *text;
     int base;
-    long value;
+    vx_int64_t value;
     size_t taken;
 };
 
@@ -276,7 +276,7 @@ TEST(PlainNumbers, FollowTheBase) {
                           {"179", 8, 15, 2},
                           {"10", 8, 8, 2},
                           {"1234567890123456789", 0, 1234567890123456789, 19},
-                          {"-99999999999999999999", 0, LONG_MIN, 21}}) {
+                          {"-99999999999999999999", 0, INT64_MIN, 21}}) {
         cdgen cx;
         char *end = nullptr;
         EXPECT_EQ(int_from_text(cx, row.text, &end, row.base), row.value) << row.text;

@@ -14,12 +14,6 @@
 
 namespace {
 
-/* What may end a line's text before its newline: quotes, comments, and the NUL after the last byte. They are rare, so
- * the next one is searched for once, however many lines come before it. */
-char *next_mark(char *from) {
-    return from + strcspn(from, "\"#/");
-}
-
 /* Copies up to `room` bytes of the source; 0 at its end. */
 size_t read_some(cdgen &cx, char *to, size_t room) {
     source_file &source = cx.source.cdb_fp;
@@ -47,38 +41,59 @@ bool refill(cdgen &cx) {
     size_t n = read_some(cx, source.buffer.data() + begun, SOURCE_BUFFER - begun);
     source.pos = 0;
     source.end = begun + n;
-    source.buffer[source.end] = '\0';
-    source.mark = next_mark(source.buffer.data());
+    memset(source.buffer.data() + source.end, 0, SCAN_BLOCK);
+    source.places.scan(source.buffer.data(), source.end);
+    source.mark = source.places.marks.first_from(0);
     return n > 0;
 }
 
-source_line whole_line(source_file &source, char *begin, char *newline) {
-    source.pos += static_cast<size_t>(newline - begin) + 1;
-    if (source.mark < begin)
-        source.mark = next_mark(begin);
-    return {begin, newline, source.buffer.data() + source.end, source.mark};
+/* The next line, of so many bytes, in the buffer. */
+source_line whole_line(source_file &source, size_t length) {
+    size_t place = source.pos;
+    char *begin = source.buffer.data() + place;
+    if (source.mark < place)
+        source.mark = source.places.marks.first_from(place);
+    source.pos += length + 1;
+    return {begin,
+            begin + length,
+            source.buffer.data() + source.end,
+            source.buffer.data() + source.mark,
+            &source.places.marks,
+            place};
 }
 
-source_line cut_line(cdgen &cx, const char *begin, size_t length) {
-    cx.source.cdb_fp.pos += length;
-    memcpy(cx.source.inbuf, begin, length);
-    cx.source.inbuf[length] = '\0';
-    cx.source.cdb_fp.cut_mark = next_mark(cx.source.inbuf);
-    return {cx.source.inbuf, cx.source.inbuf + length, cx.source.inbuf + length, cx.source.cdb_fp.cut_mark};
+/* The next bytes, which no newline follows, in inbuf. */
+source_line cut_line(cdgen &cx, size_t length) {
+    source_file &source = cx.source.cdb_fp;
+    size_t place = source.pos;
+    char *begin = cx.source.inbuf;
+    memcpy(begin, source.buffer.data() + place, length);
+    begin[length] = '\0';
+    source.pos += length;
+    size_t mark = source.places.marks.first_from(place) - place;
+    return {begin, begin + length, begin + length, begin + std::min(mark, length), &source.places.marks, place};
 }
 
 source_line some_line(cdgen &cx) {
     source_file &source = cx.source.cdb_fp;
     for (;;) {
-        char *begin = source.buffer.data() + source.pos;
-        size_t there = std::min(LINE_MAX_CHARS, source.end - source.pos);
-        if (void *newline = memchr(begin, '\n', there))
-            return whole_line(source, begin, static_cast<char *>(newline));
-        if (there == LINE_MAX_CHARS || (!refill(cx) && there > 0))
-            return cut_line(cx, source.buffer.data() + source.pos, there);
+        size_t newline = source.places.newlines.first_from(source.pos);
+        size_t length = newline - source.pos;
+        if (length < LINE_MAX_CHARS && newline < source.end)
+            return whole_line(source, length);
+        if (length >= LINE_MAX_CHARS)
+            return cut_line(cx, LINE_MAX_CHARS);
+        if (!refill(cx) && source.end > 0)
+            return cut_line(cx, source.end);
         if (source.end == 0)
-            return {nullptr, nullptr, nullptr, source.mark};
+            return {};
     }
+}
+
+/* The line's first mark from p on; its end if there is none. */
+char *next_mark(const source_line &line, const char *p) {
+    size_t mark = line.marks->first_from(line.place + static_cast<size_t>(p - line.begin)) - line.place;
+    return line.begin + std::min(mark, static_cast<size_t>(line.end - line.begin));
 }
 
 bool is_blank(char c) {
@@ -90,8 +105,7 @@ bool is_blank(char c) {
 char *end_by_marks(const source_line &line, char *p) {
     bool text_seen = false;
     bool quoted = false;
-    for (;; p = line.mark + 1, line.mark = next_mark(p)) {
-        char *mark = line.mark;
+    for (char *mark = line.mark;; p = mark + 1, mark = next_mark(line, p)) {
         while (!text_seen && is_blank(*p))
             ++p;
         text_seen = text_seen || p < std::min(mark, line.end);

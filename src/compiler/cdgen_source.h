@@ -2,6 +2,7 @@
 #ifndef CDGEN_CDGEN_SOURCE_H
 #define CDGEN_CDGEN_SOURCE_H
 
+#include "compiler/cdgen_scan.h"
 #include "language/limits.h"
 
 #include <array>
@@ -11,7 +12,7 @@
 
 struct cdgen;
 
-constexpr size_t SOURCE_BUFFER = 65536; /* bytes asked for by one read */
+constexpr size_t SOURCE_BUFFER = SCAN_BUFFER; /* bytes asked for by one read */
 
 /* The source while it is read; closes itself. */
 struct source_file {
@@ -28,11 +29,11 @@ struct source_file {
     std::string_view memory; /* of such a source, what has not been read */
     dev_t device = 0;
     ino_t inode = 0;
-    size_t pos = 0;           /* of the first byte of buffer not yet taken */
-    size_t end = 0;           /* of the first byte of buffer not yet filled, which is a NUL */
-    char *mark = nullptr;     /* in buffer, and */
-    char *cut_mark = nullptr; /* in a cut line: what may end a text and has not been looked at */
-    std::array<char, SOURCE_BUFFER + 1> buffer;
+    size_t pos = 0;  /* of the first byte of buffer not yet taken */
+    size_t end = 0;  /* of the first byte of buffer not yet filled */
+    size_t mark = 0; /* the first of places.marks that is not before the latest line; end before the first line */
+    scanned_places places;
+    std::array<char, SOURCE_BUFFER + SCAN_BLOCK> buffer;
 };
 
 struct source_reader {
@@ -54,7 +55,9 @@ struct source_line {
     char *begin; /* null: the source has no more lines */
     char *end;
     const char *read_end; /* of the bytes that follow in the buffer */
-    char *&mark;          /* the first mark from begin on; at or after end if the line has none */
+    char *mark;           /* the first mark; at or after end if the line has none */
+    const place_set *marks;
+    size_t place; /* of begin among them */
 };
 
 /* Fatal if the source cannot be opened or, later, read. */

@@ -6,22 +6,18 @@
 
 namespace {
 
-template <auto Record> char *record(cdgen &cx) {
-    return reinterpret_cast<char *>(&(cx.staged.*Record));
-}
-
-/* By staged_record. */
-constexpr char *(*records[STAGED_COUNT])(cdgen &) = {
-    record<&staging_records::cb_rsrc_class>,          /* STAGED_CLASS */
-    record<&staging_records::cb_rsrc_cmmap>,          /* STAGED_CMMAP */
-    record<&staging_records::cb_rsrc_variable_class>, /* STAGED_VARIABLE_CLASS */
-    record<&staging_records::cb_rsrc_pattr>,          /* STAGED_PATTR */
-    record<&staging_records::cb_rsrc_pattrC>,         /* STAGED_PATTR_C */
-    record<&staging_records::cb_rsrc_dattr>,          /* STAGED_DATTR */
-    record<&staging_records::cb_rsrc_dattrC>,         /* STAGED_DATTR_C */
-    record<&staging_records::cb_rsrc_action>,         /* STAGED_ACTION */
-    record<&staging_records::cb_rsrc_actionC>,        /* STAGED_ACTION_C */
-    record<&staging_records::cb_sd_def>,              /* STAGED_SD_DEF */
+/* By staged_record: where in the staging records. */
+constexpr size_t records[STAGED_COUNT] = {
+    offsetof(staging_records, cb_rsrc_class),          /* STAGED_CLASS */
+    offsetof(staging_records, cb_rsrc_cmmap),          /* STAGED_CMMAP */
+    offsetof(staging_records, cb_rsrc_variable_class), /* STAGED_VARIABLE_CLASS */
+    offsetof(staging_records, cb_rsrc_pattr),          /* STAGED_PATTR */
+    offsetof(staging_records, cb_rsrc_pattrC),         /* STAGED_PATTR_C */
+    offsetof(staging_records, cb_rsrc_dattr),          /* STAGED_DATTR */
+    offsetof(staging_records, cb_rsrc_dattrC),         /* STAGED_DATTR_C */
+    offsetof(staging_records, cb_rsrc_action),         /* STAGED_ACTION */
+    offsetof(staging_records, cb_rsrc_actionC),        /* STAGED_ACTION_C */
+    offsetof(staging_records, cb_sd_def),              /* STAGED_SD_DEF */
 };
 
 /* By stanza_id. */
@@ -42,7 +38,7 @@ static_assert(std::size(initialisers) == SC_PATTR_SD_DEFINITION, "init_sd_tbl op
 } // namespace
 
 char *sc_cb(cdgen &cx, const srtable_ctrl &kind) {
-    return records[kind.sc_record](cx);
+    return reinterpret_cast<char *>(&cx.staged) + records[kind.sc_record];
 }
 
 void (*sc_init_tbl(const srtable_ctrl &kind))(cdgen &) {

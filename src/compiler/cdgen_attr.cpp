@@ -16,15 +16,21 @@ struct name_value {
     size_t length;
 };
 
-name_value split_line(cdgen &cx, const attr_text &text) {
+char *find_equals(cdgen &cx, const attr_text &text) {
+    void *equals = memchr(text.name, '=', static_cast<size_t>(text.end - text.name));
+    if (equals == nullptr)
+        source_error(cx, MSG_NO_EQUALS);
+    return static_cast<char *>(equals);
+}
+
+/* known: the attribute that the line begins with; null if it is still to be found. */
+name_value split_line(cdgen &cx, const attr_text &text, const table_attrs *known) {
     char *name = text.name;
     char *end = text.end;
     cx.source.linepos = 1 + static_cast<int>(name - text.line);
     if (name == end)
         return {};
-    auto *equals = static_cast<char *>(memchr(name, '=', static_cast<size_t>(end - name)));
-    if (equals == nullptr)
-        source_error(cx, MSG_NO_EQUALS);
+    char *equals = known != nullptr ? name + known->ta_length : find_equals(cx, text);
     *equals = '\0';
     char *value = equals + 1;
     if (value[0] == '"' && value[1] == '"' && value[2] == '\0')
@@ -39,10 +45,12 @@ name_value split_line(cdgen &cx, const attr_text &text) {
     return {{name, static_cast<size_t>(equals - name)}, unquoted, length};
 }
 
-const table_attrs &known_attr(cdgen &cx, const srtable_ctrl &scp, std::string_view name) {
+/* The attribute of that name, when it was not the expected one. */
+const table_attrs &known_attr(cdgen &cx, const srtable_ctrl &scp, stanza_state &state, std::string_view name) {
     const table_attrs *attr = find_attr(scp, name);
     if (attr == nullptr)
         source_error(cx, MSG_UNKNOWN_ATTRIBUTE, name.data(), scp.sc_name);
+    state.order.took(scp, *attr);
     return *attr;
 }
 
@@ -70,13 +78,12 @@ void count_required(cdgen &cx, stanza_state &state, const table_attrs &attr) {
 
 } // namespace
 
-void save_attr_line(cdgen &cx, const attr_text &text, stanza_id kind) {
-    const srtable_ctrl &scp = sc_tables[kind];
-    stanza_state &state = cx.framing.stanzas[kind];
-    auto [name, value, length] = split_line(cx, text);
+void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, stanza_state &state) {
+    const table_attrs *expected = state.order.expected(scp, {text.name, static_cast<size_t>(text.end - text.name)});
+    auto [name, value, length] = split_line(cx, text, expected);
     if (value == nullptr)
         return;
-    const table_attrs &attr = known_attr(cx, scp, name);
+    const table_attrs &attr = expected != nullptr ? *expected : known_attr(cx, scp, state, name);
     if (cx.options.observer != nullptr)
         cx.options.observer->attribute_read({&attr, value, length});
     if (*value == '\0') {

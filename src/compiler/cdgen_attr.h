@@ -16,7 +16,7 @@ struct attr_line {
 };
 
 /* Takes one attribute line of a stanza of that kind. */
-void save_attr_line(cdgen &cx, const attr_text &text, stanza_id kind);
+void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, stanza_state &state);
 
 /* Converts the value and stores it, by the attribute's type. */
 void store_value(const attr_line &line);

@@ -3,7 +3,7 @@
 #define CDGEN_CDGEN_FRAMING_H
 
 #include "compiler/cdgen_tables.h"
-#include "language/catalogue.h"
+#include "language/attribute_order.h"
 
 #include <array>
 #include <memory>
@@ -33,8 +33,15 @@ struct dflt_tbl {
 
 /* What is known of a kind's current stanza. */
 struct stanza_state {
+    /* A stanza of the kind has given nothing yet. */
+    void restart() {
+        req_mask = opt_mask = 0;
+        order.restart();
+    }
+
     vx_uint32_t req_mask = 0; /* required attributes seen */
     vx_uint32_t opt_mask = 0; /* optional attributes seen, with their OPTIONAL bit */
+    language::attribute_order order;
     dflt_tbl dflt;
 };
 

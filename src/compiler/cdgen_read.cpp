@@ -59,7 +59,7 @@ void begin_sd_stanza(cdgen &cx) {
             forget_values(cx, state.dflt);
     }
     sc_init_tbl (*cx.framing.scp)(cx);
-    state.req_mask = state.opt_mask = 0;
+    state.restart();
 }
 
 /* Attribute records stay open: their own kind's next stanza, or the end of input, completes them. */
@@ -72,7 +72,7 @@ void begin_plain_stanza(cdgen &cx) {
         cmplt_actionC_tbl(cx);
     sc_init_tbl (*cx.framing.scp)(cx);
     forget_values(cx, cx.framing.state->dflt);
-    cx.framing.state->req_mask = cx.framing.state->opt_mask = 0;
+    cx.framing.state->restart();
     cx.sd.forget_owner();
 }
 
@@ -97,7 +97,7 @@ void take_line(cdgen &cx, const attr_text &text) {
     else if (cx.framing.table_id < 0)
         source_error(cx, MSG_NO_STANZA);
     else
-        save_attr_line(cx, text, static_cast<stanza_id>(cx.framing.table_id));
+        save_attr_line(cx, text, *cx.framing.scp, *cx.framing.state);
 }
 
 namespace {

@@ -54,5 +54,6 @@ tbl *sc_sd_tbl(cdgen &cx, const srtable_ctrl &kind) {
 
 void save_attr(cdgen &cx, char *il, int table_id) {
     char *name = il + strspn(il, " \t");
-    save_attr_line(cx, {il, name, name + strlen(name)}, static_cast<stanza_id>(table_id));
+    auto kind = static_cast<size_t>(table_id);
+    save_attr_line(cx, {il, name, name + strlen(name)}, sc_tables[kind], cx.framing.stanzas[kind]);
 }

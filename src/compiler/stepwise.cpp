@@ -128,7 +128,7 @@ void stepwise_compiler::begin_ownerless_run(int kind) {
     cx.framing.state = &cx.framing.stanzas[static_cast<size_t>(kind)];
     cx.framing.table_id = kind;
     sc_init_tbl (*cx.framing.scp)(cx);
-    cx.framing.state->req_mask = cx.framing.state->opt_mask = 0;
+    cx.framing.state->restart();
     cx.framing.state->dflt = {};
 }
 

@@ -11,10 +11,11 @@
 class name_index {
 public:
     static constexpr int NOT_FOUND = -1;
+    static constexpr std::size_t MOST_NAMES = 64;
 
     constexpr name_index() = default;
 
-    /* name_of(i), for i below count, are the names; at most 64, no two alike in length and in the first, the
+    /* name_of(i), for i below count, are the names; at most MOST_NAMES, no two alike in length and in the first, the
      * middle and the last character. (If two are, the search for a multiplier does not end, and the
      * compiler says so.) */
     template <class NameOf> consteval name_index(std::size_t count, NameOf name_of) {

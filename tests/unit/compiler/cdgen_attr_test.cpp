@@ -300,7 +300,7 @@ TEST(AttributeOrder, OptionalAttributesComeAfterAllRequiredOnes) {
             if (row.optional == 0)
                 continue;
             for (vx_uint32_t bit = 1; bit <= complete_mask; bit <<= 1) {
-                c.state(kind.kind) = {.req_mask = complete_mask & ~bit, .opt_mask = 0, .dflt = {}};
+                c.state(kind.kind) = {.req_mask = complete_mask & ~bit, .opt_mask = 0, .order = {}, .dflt = {}};
                 EXPECT_EQ(c.feeding(kind.kind, row.line), (ending{TOO_EARLY + name_in(row.line), LINE, 1}));
                 EXPECT_EQ(c.state(kind.kind).opt_mask, 0U);
             }

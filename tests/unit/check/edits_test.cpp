@@ -48,7 +48,7 @@ TEST(Edits, CountCharactersToo) {
     std::string text = "\tName=\xC3\xA4.b\n";
     char *mark = text.data() + text.size();
     check::current_line line;
-    line.read({text.data(), text.data() + text.size() - 1, mark, mark}, 1);
+    line.read({text.data(), text.data() + text.size() - 1, mark, mark, nullptr, 0}, 1);
     check::edit made = line.replacement({1, 10, 1}, line.raw, "c");
     EXPECT_EQ(made.column, 10u);
     EXPECT_EQ(made.character, 9u);

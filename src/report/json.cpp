@@ -44,22 +44,7 @@ public:
         to.open_list("findings");
     }
     void add(const check::finding &found) override {
-        to.open_object();
-        to.add_text("code", found.code);
-        to.add_text("severity", found.error ? "error" : "warning");
-        to.add_text("name", found.name);
-        to.add_text("message", found.text);
-        add_place(to, found.at, found.source);
-        to.add_text("source", found.source);
-        to.open_list("notes");
-        for (const check::note &more : found.notes) {
-            to.open_object();
-            to.add_text("message", more.text);
-            add_place(to, more.at, source_of(more, found));
-            to.close();
-        }
-        to.close();
-        to.close();
+        to.add_whole([&] { add_members(found); });
     }
     void end_source(const check::totals &count) override {
         to.close();
@@ -80,6 +65,25 @@ public:
     }
 
 private:
+    void add_members(const check::finding &found) {
+        to.open_object();
+        to.add_text("code", found.code);
+        to.add_text("severity", found.error ? "error" : "warning");
+        to.add_text("name", found.name);
+        to.add_text("message", found.text);
+        add_place(to, found.at, found.source);
+        to.add_text("source", found.source);
+        to.open_list("notes");
+        for (const check::note &more : found.notes) {
+            to.open_object();
+            to.add_text("message", more.text);
+            add_place(to, more.at, source_of(more, found));
+            to.close();
+        }
+        to.close();
+        to.close();
+    }
+
     void add_counts(const check::totals &count) {
         to.add_number("errors", count.errors);
         to.add_number("warnings", count.warnings);

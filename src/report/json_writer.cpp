@@ -69,10 +69,35 @@ void json_writer::close() {
     text += closed.end;
     if (levels.empty())
         text += '\n';
-    if (levels.empty() || text.size() >= PORTION) {
-        to(text);
-        text.clear();
+    if (levels.empty() || text.size() >= PORTION)
+        write_out();
+}
+
+void json_writer::write_out() {
+    if (is_held)
+        return;
+    to(text);
+    text.clear();
+}
+
+void json_writer::add_whole(const std::function<void()> &members) {
+    struct {
+        std::size_t text, levels;
+        bool is_empty;
+    } before = {text.size(), levels.size(), levels.back().is_empty};
+    is_held = true;
+    try {
+        members();
+    } catch (...) {
+        text.resize(before.text);
+        levels.resize(before.levels);
+        levels.back().is_empty = before.is_empty;
+        is_held = false;
+        throw;
     }
+    is_held = false;
+    if (text.size() >= PORTION)
+        write_out();
 }
 
 void json_writer::add_text(std::string_view key, std::string_view value) {

@@ -40,6 +40,9 @@ public:
     /* A value that is JSON already. */
     void add_json(std::string_view key, std::string_view value);
 
+    /* Adds members all or not at all: if adding them fails, such as for lack of memory, nothing of them stays. */
+    void add_whole(const std::function<void()> &members);
+
     /* Adds the members that say which schema a document follows: a file that is installed, and its version. */
     void add_schema(std::string_view file, unsigned version);
 
@@ -54,9 +57,12 @@ private:
     void next(std::string_view key);
     void new_line();
 
+    void write_out();
+
     output to;
     std::string text; /* not yet written */
     std::vector<level> levels;
+    bool is_held = false; /* true: nothing is written out, since it may have to be taken back */
 };
 
 } // namespace report

@@ -92,7 +92,7 @@ public:
         file = name;
     }
     void add(const finding &found) override {
-        to.add_json({}, json_line(result_of(file, found)));
+        to.add_whole([&] { to.add_json({}, json_line(result_of(file, found))); });
     }
     void end_source(const check::totals & /* count */) override {}
     void fail_source(const std::string & /* why */) override {}

@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <new>
 #include <string>
 
 namespace {
@@ -53,6 +54,23 @@ TEST(JsonWriter, IndentsAndSeparates) {
   "is": true
 }
 )");
+}
+
+TEST(JsonWriter, TakesBackMembersThatCannotBeAddedAsAWhole) {
+    std::string written;
+    report::json_writer to([&](std::string_view part) { written += part; });
+    to.open_list();
+    EXPECT_THROW(to.add_whole([&] {
+        to.open_object();
+        to.add_text("text", std::string(100'000, 'x'));
+        to.open_list("list");
+        to.close();
+        throw std::bad_alloc();
+    }),
+                 std::bad_alloc);
+    to.add_whole([&] { to.add_number({}, 1); });
+    to.close();
+    EXPECT_EQ(written, "[\n  1\n]\n");
 }
 
 TEST(JsonWriter, DoesNotKeepALongDocument) {

@@ -55,7 +55,7 @@ def findings(sources, directory):
     for path, source in zip(paths, sources):
         path.write_bytes(source.encode("latin-1"))
     result = subprocess.run([PROGRAMS.cdef, "check", "--format", "json", *paths], capture_output=True, timeout=600)
-    return [each["findings"] for each in json.loads(result.stdout)]
+    return [each["findings"] for each in json.loads(result.stdout)["sources"]]
 
 
 def added(before, after):

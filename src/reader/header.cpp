@@ -41,12 +41,7 @@ std::uint32_t xor_of_words(std::span<const std::byte> words, const std::byte *fi
 }
 
 void check_checksum(reporter &out, const database &db) {
-    constexpr std::size_t FIRST = offsetof(orb_cdb_header_t, cdb_hdr_format);
-    constexpr std::size_t WORD = sizeof(std::uint32_t);
-    auto raw = db.file().raw();
-    std::size_t length = std::min<std::size_t>(db.header().cdb_hdr_length, raw.size() - WORD);
-    std::size_t words = length < WORD ? 0 : (length - WORD) / WORD;
-    std::uint32_t sum = xor_of_words(raw.subspan(FIRST, words * WORD), raw.data());
+    std::uint32_t sum = sum_of(db);
     auto expected = bytes(std::as_bytes(std::span(&sum, 1)), db.order()).number<std::uint32_t>(0);
     if (expected != db.header().cdb_hdr_checksum)
         out.report(check::CHECKSUM, whole_file,
@@ -62,6 +57,15 @@ void check_record_sizes(reporter &out, const database &db) {
 }
 
 } // namespace
+
+std::uint32_t sum_of(const database &db) {
+    constexpr std::size_t FIRST = offsetof(orb_cdb_header_t, cdb_hdr_format);
+    constexpr std::size_t WORD = sizeof(std::uint32_t);
+    auto raw = db.file().raw();
+    std::size_t length = std::min<std::size_t>(db.header().cdb_hdr_length, raw.size() - WORD);
+    std::size_t words = length < WORD ? 0 : (length - WORD) / WORD;
+    return xor_of_words(raw.subspan(FIRST, words * WORD), raw.data());
+}
 
 bool check_header(reporter &out, const database &db) {
     if (db.file().size() < sizeof(orb_cdb_header_t)) {

@@ -13,6 +13,9 @@ inline const location whole_file = {.section = std::nullopt, .record = "orb_cdb_
  * header, or has no format word. */
 bool check_header(reporter &out, const database &db);
 
+/* The checksum that a file should have, as its bytes are stored. At least a header. */
+std::uint32_t sum_of(const database &db);
+
 /* Checks the largest IDs that the header holds. */
 void check_largest_ids(reporter &out, const database &db);
 

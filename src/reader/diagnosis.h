@@ -1,0 +1,32 @@
+/* diagnosis.h: which findings in a database are consequences of which others. */
+#ifndef CDGEN_READER_DIAGNOSIS_H
+#define CDGEN_READER_DIAGNOSIS_H
+
+#include "cdb_view.h"
+
+namespace cdb {
+
+/* Code of a number that no rule of verify() is about, and that everything found contradicts. */
+inline constexpr std::string_view CODE_CONTRADICTING = "CDB108";
+
+/* A finding, and which one it is a consequence of. */
+struct diagnosed {
+    finding found;
+    std::size_t cause; /* position of its cause in the diagnosis; its own position: it is a cause */
+};
+
+/* What verify() finds, each cause followed by its consequences.
+ *
+ * If there are several errors and one corrected number of the file removes all of them, the number is the cause of all:
+ * the finding at its field, or, if there is none, one of CODE_CONTRADICTING. Numbers that are tried: one that makes the
+ * checksum right, or one that a finding or a neighbouring table expects.
+ *
+ * Otherwise an error in a reference, a list, a table or a section is the cause of what is found in the same section
+ * after it, and the first error that of a wrong checksum.
+ *
+ * Takes the time of verify(), and if there are several errors that of some hundred more, but for at most 64 MB. */
+std::vector<diagnosed> diagnose(const database &db);
+
+} // namespace cdb
+
+#endif

@@ -2,6 +2,8 @@
 #ifndef CDGEN_TESTS_MESSAGES_DOCUMENT_H
 #define CDGEN_TESTS_MESSAGES_DOCUMENT_H
 
+#include "places.h"
+
 #include <algorithm>
 #include <fstream>
 #include <map>
@@ -14,7 +16,7 @@ namespace messages_document {
 /* The document's sections by code, each from its title to the next one's, with links reduced to their texts. */
 inline std::map<std::string, std::string> sections() {
     std::stringstream whole;
-    whole << std::ifstream(CDB_PROJECT "/docs/messages.md").rdbuf();
+    whole << std::ifstream(places::in_project("docs/messages.md")).rdbuf();
     std::string text = std::regex_replace(whole.str(), std::regex(R"(\[([^\]]*)\]\([^)]*\))"), "$1");
     std::map<std::string, std::string> found;
     for (size_t at = text.find("### S"); at != std::string::npos;) {

@@ -1,4 +1,5 @@
 #include "format/sections.h"
+#include "places.h"
 
 #include <gtest/gtest.h>
 
@@ -10,7 +11,7 @@
 namespace {
 
 std::string fields_header() {
-    std::ifstream in(CDB_PROJECT "/include/cdb_fields.h");
+    std::ifstream in(places::in_project("include/cdb_fields.h"));
     std::stringstream text;
     text << in.rdbuf();
     return text.str();

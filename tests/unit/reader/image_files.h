@@ -3,6 +3,7 @@
 #define CDGEN_IMAGE_FILES_H
 
 #include "cdb_view.h"
+#include "places.h"
 
 #include <gtest/gtest.h>
 
@@ -26,7 +27,7 @@ inline std::string_view name_of(std::endian order) {
 
 /* An image, which a test may change. */
 inline std::vector<std::byte> load(std::string_view name, std::endian order) {
-    std::string path = std::string(CDB_IMAGES "/").append(name).append(".").append(name_of(order)).append(".cdef");
+    std::string path = places::in_images(std::string(name).append(".").append(name_of(order)).append(".cdef"));
     std::error_code error;
     std::vector<std::byte> contents = cdb::read_file(path.c_str(), error);
     EXPECT_FALSE(error) << path << ": " << error.message();

@@ -3,6 +3,7 @@
 
 #include "cdb_view.h"
 
+#include "places.h"
 #include "reader/image_files.h"
 
 #include <filesystem>
@@ -33,7 +34,7 @@ struct document_row {
 
 std::vector<document_row> document_rows() {
     std::vector<document_row> rows;
-    std::ifstream file(CDB_IMAGES "/document.rows");
+    std::ifstream file(places::in_images("document.rows"));
     for (document_row row; file >> row.offset >> row.size && std::getline(file >> std::ws, row.content);)
         rows.push_back(row);
     return rows;
@@ -245,7 +246,7 @@ testing::AssertionResult tiles(std::span<const std::byte> image) {
 }
 
 TEST(CdbRegions, TileEveryImage) {
-    for (const auto &file : std::filesystem::recursive_directory_iterator(CDB_IMAGES))
+    for (const auto &file : std::filesystem::recursive_directory_iterator(places::in_images("")))
         if (file.path().extension() == ".cdef") {
             std::error_code error;
             EXPECT_TRUE(tiles(cdb::read_file(file.path().c_str(), error))) << file.path();

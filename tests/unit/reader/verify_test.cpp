@@ -3,6 +3,7 @@
 
 #include "cdb_view.h"
 
+#include "places.h"
 #include "reader/image_files.h"
 #include "reader/read_everything.h"
 
@@ -71,7 +72,7 @@ void read_line(broken_image &image, const std::string &line) {
 
 std::vector<broken_image> broken_images() {
     std::vector<broken_image> all;
-    for (const auto &file : std::filesystem::directory_iterator(CDB_PROJECT "/tests/image/broken")) {
+    for (const auto &file : std::filesystem::directory_iterator(places::in_project("tests/image/broken"))) {
         broken_image image = {.name = file.path().stem().string(), .native_only = false, .expected = {}};
         std::ifstream lines(file.path());
         for (std::string line; std::getline(lines, line);)
@@ -153,7 +154,7 @@ TEST(CdbVerify, CodesAscend) {
 /* docs/reader.md: | CDB101 | error | file too short for a header | ... | */
 TEST(CdbVerify, DocumentListsTheRules) {
     std::vector<std::string> documented, known;
-    std::ifstream document(CDB_PROJECT "/docs/reader.md");
+    std::ifstream document(places::in_project("docs/reader.md"));
     for (std::string line; std::getline(document, line);)
         if (line.starts_with("| CDB"))
             documented.push_back(line.substr(0, line.find(" | ", line.find(" | ", line.find(" | ") + 1) + 1)));

@@ -43,10 +43,8 @@ void reference_walk::expect_data_type(const location &place, const field &f, vx_
 
 void reference_walk::follow(const location &place, const bytes &area, std::size_t offset, std::span<const field> fields,
                             vx_data_type_t owner_type) {
-    for (const field &f : fields) {
-        auto type = f.type_at == TYPE_OF_OWNER ? owner_type : area.number<vx_data_type_t>(offset + f.type_at);
-        follow_field(place, f, area.number<std::uint32_t>(offset + f.offset), type);
-    }
+    for (const field &f : fields)
+        follow_field(place, f, area.number<std::uint32_t>(offset + f.offset), owner_type);
 }
 
 void reference_walk::follow_field(const location &place, const field &f, std::uint32_t word, vx_data_type_t type) {

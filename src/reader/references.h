@@ -15,8 +15,8 @@ public:
     reference_walk(const reference_walk &) = delete;
     reference_walk &operator=(const reference_walk &) = delete;
 
-    /* Follows the leading fields of a record at an offset of an area. owner_type: of the values, where the record
-     * itself does not name their type. */
+    /* Follows the leading fields of a record at an offset of an area. owner_type: the type of its values, which such a
+     * record does not name itself. */
     void follow(const location &place, const bytes &area, std::size_t offset, std::span<const field> fields,
                 vx_data_type_t owner_type);
     void follow_field(const location &place, const field &f, std::uint32_t word, vx_data_type_t type);

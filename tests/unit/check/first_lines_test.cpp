@@ -39,6 +39,18 @@ TEST(FirstLines, HoldsManyTextsAndNumbers) {
     }
 }
 
+/* With so many texts some share a tag, which has 32 bits. */
+TEST(FirstLines, TellsTextsOfOneTagApart) {
+    constexpr int COUNT = 300'000;
+    check::first_lines lines;
+    for (int i = 1; i <= COUNT; ++i)
+        lines.line_of(std::to_string(i)) = i;
+    int wrong = 0;
+    for (int i = 1; i <= COUNT; ++i)
+        wrong += lines.find(std::to_string(i)) != i;
+    EXPECT_EQ(wrong, 0);
+}
+
 TEST(FirstLines, IsEmptyWhenCleared) {
     check::first_lines lines;
     lines.line_of("a") = 1;

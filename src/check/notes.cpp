@@ -4,6 +4,7 @@
 
 #include "check/meant.h"
 #include "check/numbers.h"
+#include "check/value_notes.h"
 #include "format/data_types.h"
 #include "format/names.h"
 #include "language/names.h"
@@ -19,26 +20,6 @@ namespace {
 using language::listed;
 using language::quoted;
 using language::suggestion;
-
-const char *form_of(vx_data_type_t type) {
-    switch (scalar_vx(type)) {
-    case VX_INT32:
-    case VX_INT64:
-        return "a decimal integer";
-    case VX_UINT32:
-    case VX_UINT64:
-        return "a decimal integer without a sign";
-    case VX_FLOAT32:
-    case VX_FLOAT64:
-        return "a floating point number";
-    case VX_BINARY_PTR:
-        return "0x and pairs of hexadecimal digits";
-    case VX_CHAR_PTR:
-        return "a text that is not empty";
-    default:
-        return "no value that could be written";
-    }
-}
 
 mention header_of(const stanza_record &stanza) {
     return {stanza.header, {}, stanza.source};
@@ -174,7 +155,46 @@ void bad_value(noting &n) {
     else if (type == VX_UNKNOWN)
         n.add(given_type.at, "unknown data type: " + language::type_suggestion(given_type.text, true));
     else
-        n.add_here(quoted(vxTypeStr[type]) + " takes " + form_of(type));
+        n.add_here(value_note(n.see.attr(), type, n.see.value()));
+}
+
+void no_equals(noting &n) {
+    if (n.kind >= 0)
+        n.add_here(no_equals_note(table_of(n.kind), n.marked()));
+}
+
+void open_quote(noting &n) {
+    n.add_here(open_quote_note(n.marked()));
+}
+
+void no_value(noting &n) {
+    std::string_view line = n.see.line.raw;
+    n.add_here(no_value_note(n.see.attr(), line.substr(std::min(line.find('='), line.size() - 1) + 1)));
+}
+
+void wrong_varieties(noting &n) {
+    n.add_here(variety_note(n.see.value()));
+}
+
+void one_bound(noting &n) {
+    n.add_here("write both bounds with a comma between them: `Range=low,high`");
+}
+
+void value_of_structure(noting &n) {
+    n.add_here("remove this line: the value is made of the defaults of the elements' types, and an element takes no "
+               "`DefaultValue` either");
+}
+
+void value_of_element(noting &n) {
+    n.add_here("remove this line: an element has the default of its type");
+}
+
+void no_class_at_all(noting &n) {
+    n.add_here("begin the source with a `ControlDefinition`");
+}
+
+void no_map(noting &n) {
+    n.add_here("add a `ClassToManagerMapping`, which names the resource manager of the class");
 }
 
 bool is_expected_index(const view &see) {
@@ -196,10 +216,11 @@ void wrong_index(noting &n) {
 }
 
 void bad_default(noting &n) {
+    constexpr const char *NO_SBS = "only elements of inputs and responses can be of type `SBS`: choose another type";
     if (!is_sd_kind(n.kind))
-        return n.show(n.stanza().data_type, "the DataType of this " + n.kind_name());
+        return n.show(n.stanza().data_type, NO_SBS);
     for (const mention &odd : n.see.known.run.odd_types)
-        n.show(odd, odd.text == "SBS" ? "the element's DataType" : language::type_suggestion(odd.text, true));
+        n.show(odd, odd.text == "SBS" ? NO_SBS : "unknown data type: " + language::type_suggestion(odd.text, true));
 }
 
 void no_manager(noting &n) {
@@ -225,7 +246,10 @@ struct notes_of {
 
 constexpr notes_of table[] = {
     {MSG_NO_STANZA, no_stanza},
+    {MSG_NO_EQUALS, no_equals},
+    {MSG_UNMATCHED_QUOTES, open_quote},
     {MSG_UNKNOWN_ATTRIBUTE, unknown_name},
+    {MSG_NO_VALUE, no_value},
     {MSG_OPTIONAL_TOO_EARLY, too_early},
     {MSG_REPEATED_ATTRIBUTE, repeated},
     {MSG_NO_SD_ATTRIBUTE, no_sd_attribute},
@@ -240,11 +264,18 @@ constexpr notes_of table[] = {
     {MSG_INVALID_PROPERTY, unknown_property},
     {MSG_INVALID_DATA_TYPE, unknown_type},
     {MSG_INVALID_VARIABLE_TYPE, unknown_variable_type},
+    {MSG_INVALID_VARIETY, wrong_varieties},
+    {MSG_TOO_MANY_VARIETIES, wrong_varieties},
+    {MSG_RANGE_NEEDS_TWO, one_bound},
     {MSG_INVALID_VALUE, bad_value},
+    {MSG_SD_DEFAULT, value_of_structure},
+    {MSG_ELEMENT_DEFAULT, value_of_element},
     {MSG_INDEX_NOT_CONSECUTIVE, wrong_index},
     {MSG_SBS_TYPE, bad_default},
     {MSG_NO_ELEMENT_DEFAULT, bad_default},
     {MSG_NO_ELEMENT_INITIAL, bad_default},
+    {MSG_NO_CLASSES, no_class_at_all},
+    {MSG_NO_MAPS, no_map},
     {MSG_NO_MANAGER, no_manager},
     {MSG_KEYS_REVERSED, keys},
 };

@@ -94,7 +94,8 @@ constexpr message table[] = {
      "The stanza has no valid value above this line.", "Put `ValueDisplayName` after its valid value."},
     {MSG_SD_DEFAULT, "S209", "Default values not expected; place default values in individual *SDDef stanzas.", FIRST,
      mark_kind::name, blame::source, "An attribute of structured data has a `DefaultValue` or an `InitialValue`.",
-     "Remove it: the value is built from the elements."},
+     "Remove it: the value is built from the defaults of the elements' types. An element takes no `DefaultValue` "
+     "either."},
     {MSG_INDEX_NOT_CONSECUTIVE, "S210", "ElementIndeces must be consecutive", FIRST, mark_kind::value, blame::source,
      "An `ElementIndex` is not the next one of its run, or an element before it has none. Or an earlier "
      "number overflowed, after which the index 0 is refused: the note says where.",

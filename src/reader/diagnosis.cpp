@@ -89,8 +89,8 @@ auto key_of(const finding &f) {
 /* The warnings that the corrected database has too are nothing of it. */
 std::vector<diagnosed> caused_by_one(const database &db, std::vector<finding> &&found, const repair &repaired) {
     region at = corrected_region(repaired);
-    auto cause =
-        std::find_if(found.begin(), found.end(), [&](const finding &f) { return f.offset - at.offset < at.size; });
+    auto cause = std::find_if(found.begin(), found.end(),
+                              [&](const finding &f) { return is_error(f) && f.offset - at.offset < at.size; });
     if (cause == found.end())
         cause = found.insert(found.begin(), contradicted(db, repaired, at));
     auto first = static_cast<std::size_t>(cause - found.begin());

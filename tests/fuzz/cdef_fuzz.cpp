@@ -216,6 +216,15 @@ bool is_text(const bytes &file) {
     return !file.empty() && !has_format_word(file) && std::memchr(file.data(), 0, beginning) == nullptr;
 }
 
+/* A consequence comes after its cause, which is the consequence of nothing. */
+void expect_causes(const json &findings) {
+    for (std::size_t i = 0; i < findings.size(); ++i) {
+        const json &cause = findings[i].at("cause");
+        bool right = cause.is_null() || (cause < i && findings[cause.get<std::size_t>()].at("cause").is_null());
+        fuzz::require(right, "a consequence without a cause");
+    }
+}
+
 void look_at_verify(const outcome &came, const bytes &image, const words &form) {
     if (is_text(image)) {
         fuzz::require(came.status == cdef::FAILED && came.out.empty(), "a text is verified");
@@ -226,9 +235,11 @@ void look_at_verify(const outcome &came, const bytes &image, const words &form) 
     judgement is = judge(image);
     bool passes = has("--werror") ? !is.found : is.sound;
     fuzz::require(came.status == (passes ? cdef::OK : cdef::FOUND) && came.err.empty(), "another verdict");
-    if (has("--json"))
-        fuzz::require(parsed(came.out).at("files").at(0).at("sound") == passes, "another verdict in JSON");
-    else
+    if (has("--json")) {
+        json file = parsed(came.out).at("files").at(0);
+        fuzz::require(file.at("sound") == passes, "another verdict in JSON");
+        expect_causes(file.at("findings"));
+    } else
         fuzz::require(came.out.empty() != (has("--quiet") ? !is.sound : is.found), "findings are not told, or none");
 }
 

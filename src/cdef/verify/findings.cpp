@@ -8,6 +8,7 @@
 #include <charconv>
 #include <cstdint>
 #include <string_view>
+#include <utility>
 
 namespace cdef::verify {
 
@@ -46,7 +47,28 @@ std::string json_value(const std::string &shown) {
     return value;
 }
 
-void add_finding(report::json_writer &to, const cdb::finding &f) {
+std::vector<cdb::diagnosed> errors_of(std::vector<cdb::diagnosed> &&all) {
+    std::vector<std::size_t> place(all.size());
+    std::vector<cdb::diagnosed> errors;
+    for (std::size_t i = 0; i < all.size(); ++i) {
+        if (all[i].found.broken->level == cdb::severity::warning)
+            continue;
+        place[i] = errors.size();
+        std::size_t cause = all[all[i].cause].found.broken->level == cdb::severity::error ? all[i].cause : i;
+        errors.push_back({std::move(all[i].found), place[cause]});
+    }
+    return errors;
+}
+
+std::string note_of(const std::string &file, std::size_t consequences) {
+    std::string note = text::escaped(file) + ": note: ";
+    if (consequences == 1)
+        return note + "1 finding follows from this one; --all shows it\n";
+    return note + std::to_string(consequences) + " findings follow from this one; --all shows them\n";
+}
+
+void add_finding(report::json_writer &to, const cdb::diagnosed &each, std::size_t at) {
+    const cdb::finding &f = each.found;
     to.open_object();
     to.add_text("code", f.broken->code);
     to.add_text("severity", name_of(f.broken->level));
@@ -61,6 +83,10 @@ void add_finding(report::json_writer &to, const cdb::finding &f) {
     to.add_number("offset", f.offset);
     to.add_json("found", json_value(f.found));
     to.add_json("expected", json_value(f.expected));
+    if (each.cause == at)
+        to.add_null("cause");
+    else
+        to.add_number("cause", each.cause);
     to.close();
 }
 

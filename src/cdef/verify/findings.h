@@ -2,10 +2,11 @@
 #ifndef CDGEN_CDEF_VERIFY_FINDINGS_H
 #define CDGEN_CDEF_VERIFY_FINDINGS_H
 
-#include "cdb_view.h"
+#include "reader/diagnosis.h"
 #include "report/json_writer.h"
 
 #include <string>
+#include <vector>
 
 namespace cdef::verify {
 
@@ -18,8 +19,14 @@ std::string line_of(const std::string &file, const cdb::finding &f);
 /* What was found, or expected, as JSON: a number, whether it is shown in decimal or in hexadecimal, or a text. */
 std::string json_value(const std::string &shown);
 
-/* Adds a finding to a list. */
-void add_finding(report::json_writer &to, const cdb::finding &f);
+/* Without warnings. What only a warning explains explains itself. */
+std::vector<cdb::diagnosed> errors_of(std::vector<cdb::diagnosed> &&all);
+
+/* One line that says how many findings follow from the one before it, with a newline. */
+std::string note_of(const std::string &file, std::size_t consequences);
+
+/* Adds a finding to a list. at: its position there. */
+void add_finding(report::json_writer &to, const cdb::diagnosed &each, std::size_t at);
 
 } // namespace cdef::verify
 

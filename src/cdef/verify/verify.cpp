@@ -12,6 +12,7 @@
 
 #include <algorithm>
 #include <memory>
+#include <utility>
 
 namespace cdef {
 
@@ -22,6 +23,7 @@ struct verify_options {
     std::string form;
     bool warnings_count = false; /* a database with warnings fails as one with errors does */
     bool quiet = false;          /* warnings are not shown */
+    bool shows_all = false;      /* consequences are shown too */
 };
 
 /* Shows what is found in each database. */
@@ -32,16 +34,26 @@ public:
     verify_form &operator=(const verify_form &) = delete;
     virtual ~verify_form() = default;
 
-    virtual void add_file(const std::string &name, const std::vector<cdb::finding> &findings, bool sound) = 0;
+    virtual void add_file(const std::string &name, const std::vector<cdb::diagnosed> &findings, bool sound) = 0;
     virtual void add_unreadable(const std::string &name, const std::string &why) = 0;
     virtual void close() = 0;
 };
 
+/* Each cause with the number of its consequences, or with these. */
 class text_form : public verify_form {
 public:
-    void add_file(const std::string &name, const std::vector<cdb::finding> &findings, bool /* sound */) override {
-        for (const cdb::finding &f : findings) {
-            out.text += verify::line_of(name, f);
+    explicit text_form(bool with_consequences) : shows_all(with_consequences) {}
+
+    void add_file(const std::string &name, const std::vector<cdb::diagnosed> &findings, bool /* sound */) override {
+        std::size_t hidden = 0;
+        for (std::size_t i = 0; i < findings.size(); ++i) {
+            bool follows = findings[i].cause != i;
+            hidden += follows && !shows_all;
+            if (!follows || shows_all)
+                out.text += (follows ? "  " : "") + verify::line_of(name, findings[i].found);
+            bool group_ends = i + 1 == findings.size() || findings[i + 1].cause == i + 1;
+            if (group_ends && hidden > 0)
+                out.text += verify::note_of(name, std::exchange(hidden, 0));
             out.flush_if_full();
         }
     }
@@ -51,6 +63,7 @@ public:
     }
 
 private:
+    bool shows_all;
     output out;
 };
 
@@ -61,13 +74,13 @@ public:
         to.add_schema("cdef-verify.schema.json", 1);
         to.open_list("files");
     }
-    void add_file(const std::string &name, const std::vector<cdb::finding> &findings, bool sound) override {
+    void add_file(const std::string &name, const std::vector<cdb::diagnosed> &findings, bool sound) override {
         to.open_object();
         to.add_text("file", name);
         to.add_truth("sound", sound);
         to.open_list("findings");
-        for (const cdb::finding &f : findings)
-            verify::add_finding(to, f);
+        for (std::size_t i = 0; i < findings.size(); ++i)
+            verify::add_finding(to, findings[i], i);
         to.close();
         to.close();
     }
@@ -86,10 +99,10 @@ private:
     report::json_writer to;
 };
 
-std::unique_ptr<verify_form> form_of(const std::string &name) {
-    if (name == "json")
+std::unique_ptr<verify_form> form_of(const verify_options &options) {
+    if (options.form == "json")
         return std::make_unique<json_form>();
-    return std::make_unique<text_form>();
+    return std::make_unique<text_form>(options.shows_all);
 }
 
 /* Shows the findings in one file; whether it passes. */
@@ -97,17 +110,17 @@ bool judge(const std::string &path, const verify_options &options, verify_form &
     input in(path);
     if (is_text(in.contents))
         throw failure(path + ": a text, not a database; 'cdef check' checks sources");
-    std::vector<cdb::finding> findings = cdb::verify(in.db);
-    auto is_warning = [](const cdb::finding &f) { return f.broken->level == cdb::severity::warning; };
+    std::vector<cdb::diagnosed> findings = cdb::diagnose(in.db);
+    auto is_warning = [](const cdb::diagnosed &each) { return each.found.broken->level == cdb::severity::warning; };
     bool sound = options.warnings_count ? findings.empty() : std::all_of(findings.begin(), findings.end(), is_warning);
     if (options.quiet)
-        std::erase_if(findings, is_warning);
+        findings = verify::errors_of(std::move(findings));
     form.add_file(path, findings, sound);
     return sound;
 }
 
 int run(const verify_options &options) {
-    std::unique_ptr<verify_form> form = form_of(options.form);
+    std::unique_ptr<verify_form> form = form_of(options);
     bool pass = true;
     bool read = true;
     for (const std::string &file : options.files) {
@@ -131,6 +144,7 @@ void add_verify(CLI::App &app, int &status) {
         app.add_subcommand("verify", "Checks whether databases are sound; prints nothing about flawless ones");
     command->add_option("FILE", options->files, "Database to verify; - is standard input")->required();
     add_forms(*command, options->form, {"text", "json"}, "Form of the findings: text or json");
+    command->add_flag("--all", options->shows_all, "Show the findings that follow from others too");
     command->add_flag("--werror", options->warnings_count, "Count warnings as errors");
     command->add_flag("-q,--quiet", options->quiet, "Show errors only");
     command->footer("Exit status: 0 without errors, 1 with errors (with --werror: or warnings), 2 if a file cannot be "

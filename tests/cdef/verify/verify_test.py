@@ -46,6 +46,7 @@ WRONG_FINDING = {
     "offset": 144,
     "found": 0x43444230,
     "expected": 0x43444231,
+    "cause": None,
 }
 CARELESS_FINDING = {
     "code": "CDB353",
@@ -58,6 +59,7 @@ CARELESS_FINDING = {
     "offset": 384,
     "found": 0,
     "expected": "in 0 bytes",
+    "cause": None,
 }
 
 
@@ -111,7 +113,7 @@ class Output(unittest.TestCase):
     def test_help(self):
         status, text, messages = verify("--help")
         self.assertEqual((status, messages), (0, ""))
-        for option in ("--format", "--json", "--werror", "-q,--quiet", "FILE"):
+        for option in ("--format", "--json", "--all", "--werror", "-q,--quiet", "FILE"):
             self.assertIn(option, text)
 
 
@@ -165,6 +167,46 @@ class Json(unittest.TestCase):
             status, text, messages = verify("--json", path)
             self.assertEqual((status, messages), (0, ""))
             self.assertIs(json.loads(text)["files"][0]["sound"], True)
+
+
+class Causes(unittest.TestCase):
+    """A count that is too large by one displaces everything after it. small.image says what is where: the class record is
+    at 144, and the number of its persistent attributes 172 bytes further."""
+
+    COUNT = (
+        "{}: error: section 0, rsrc_class_t 0, rc_num_pattrs at offset 316: contradicts the rest of the file: "
+        "found 3, expected 2 [CDB108]\n"
+    )
+
+    def setUp(self):
+        directory = tempfile.TemporaryDirectory()
+        self.addCleanup(directory.cleanup)
+        self.path = pathlib.Path(directory.name) / "count.cdef"
+        data = bytearray((PROGRAMS.images / SOUND).read_bytes())
+        data[316] = 3
+        self.path.write_bytes(data)
+
+    def test_the_cause_and_how_many_follow(self):
+        status, text, messages = verify(self.path)
+        cause, note = text.splitlines(True)
+        self.assertEqual((status, cause, messages), (1, self.COUNT.format(self.path), ""))
+        self.assertRegex(note, r"^.*: note: \d+ findings follow from this one; --all shows them\n$")
+
+    def test_all(self):
+        status, text, messages = verify("--all", self.path)
+        cause, *others = text.splitlines(True)
+        self.assertEqual((status, cause, messages), (1, self.COUNT.format(self.path), ""))
+        self.assertGreater(len(others), 5)
+        for line in others:
+            self.assertTrue(line.startswith(f"  {self.path}: "), line)
+        self.assertIn(f": note: {len(others)} findings ", verify(self.path)[1])
+
+    def test_json_has_all_findings_and_their_cause(self):
+        status, text, _ = verify("--json", self.path)
+        findings = json.loads(text)["files"][0]["findings"]
+        self.assertEqual((status, findings[0]["code"], findings[0]["field"]), (1, "CDB108", "rc_num_pattrs"))
+        self.assertEqual([each["cause"] for each in findings], [None] + [0] * (len(findings) - 1))
+        self.assertEqual(text, verify("--json", "--all", self.path)[1])
 
 
 class Input(unittest.TestCase):

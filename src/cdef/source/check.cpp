@@ -86,18 +86,20 @@ void require_sections(const cdb::database &db) {
     for (std::size_t i = 0; i < db.section_count(); ++i) {
         cdb_dsect_anchor_t anchor = db.anchor(i);
         if (!is_made(anchor.cda_type))
-            no_source("section " + std::to_string(i), "no source makes one of type " + std::to_string(anchor.cda_type));
+            no_source("section " + std::to_string(i),
+                      "no source compiles to a section of type " + std::to_string(anchor.cda_type));
         if (anchor.cda_revision != 0)
-            no_source("section " + std::to_string(i), "no source gives it a revision");
+            no_source("section " + std::to_string(i), "it has a revision, which no source can set");
         ++counts[anchor.cda_type];
     }
     if (counts[CDB_DSECT_CLASS] == 0)
         no_source("database", "it has no class");
     if (counts[CDB_DSECT_RSRC_MGR] != 1)
-        no_source("database", "a source has one manager, this has " + std::to_string(counts[CDB_DSECT_RSRC_MGR]));
-    if (counts[CDB_DSECT_CMMAP] != 1)
         no_source("database",
-                  "a source has one ClassToManagerMapping, this has " + std::to_string(counts[CDB_DSECT_CMMAP]));
+                  "a source has one manager, but this database has " + std::to_string(counts[CDB_DSECT_RSRC_MGR]));
+    if (counts[CDB_DSECT_CMMAP] != 1)
+        no_source("database", "a source has one ClassToManagerMapping, but this database has " +
+                                  std::to_string(counts[CDB_DSECT_CMMAP]));
 }
 
 } // namespace

@@ -45,7 +45,7 @@ std::string locator_name(const cdb::resource_class &c) {
             can_be_given("Locator", attr.name()))
             return std::string(attr.name());
     }
-    no_source(place_of("ResourceClass", c.name()), "its locator is the Id of no persistent attribute");
+    no_source(place_of("ResourceClass", c.name()), "its locator is not the Id of a persistent attribute");
 }
 
 /* Only then may a name and a locator follow. */
@@ -60,7 +60,7 @@ bool can_be_named(const cdb::resource_class &c) {
 /* A name that no line gives can only come from the output file's. */
 void require_default_name(const cdb::resource_class &c, std::optional<std::string> &output) {
     if (c.name().find(SUFFIX) != std::string_view::npos || (output && *output != c.name()))
-        no_source(place_of("ResourceClass", c.name()), "no line and no file gives it its name");
+        no_source(place_of("ResourceClass", c.name()), "neither a line nor a file name can give it its name");
     output = c.name();
 }
 
@@ -148,14 +148,14 @@ struct plain_stanza_writer {
 void plan_locator(std::vector<class_plan> &plans) {
     for (const class_plan &plan : plans)
         if (!plan.is_last && plan.view.record().rc_locator != 0)
-            no_source(place_of("ResourceClass", plan.view.name()), "no line sets its locator");
+            no_source(place_of("ResourceClass", plan.view.name()), "it has a locator, which no line can set");
     const cdb::resource_class &last = plans.back().view;
     if (last.record().rc_locator == NO_LOCATOR)
         return;
     auto giver = std::find_if(plans.rbegin(), plans.rend(),
                               [](const class_plan &plan) { return has_all_required(plan.view.record()); });
     if (giver == plans.rend())
-        no_source(place_of("ResourceClass", last.name()), "no line sets its locator");
+        no_source(place_of("ResourceClass", last.name()), "it has a locator, which no line can set");
     giver->locator = locator_name(last);
 }
 
@@ -210,7 +210,7 @@ private:
 void write_map(source_writer &out, const cdb::database &db) {
     cdb::class_map map = *db.maps().begin();
     if (map.record().rcm_first_key > map.record().rcm_last_key)
-        no_source("ClassToManagerMapping", "its first key is above its last");
+        no_source("ClassToManagerMapping", "its first key is greater than its last");
     map_writer(out, db, map).write();
 }
 

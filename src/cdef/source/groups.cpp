@@ -59,7 +59,7 @@ std::vector<group> groups_of(const cdb::database &db) {
         for (const cdb::variable_id &id : v.variable_ids())
             list.ids.push_back(id.number);
         if (!list.ids.empty() && (!first || list.name.empty()))
-            no_source(place_of("ResourceVariableClass", v.name()), "no attribute can name it, but it lists some");
+            no_source(place_of("ResourceVariableClass", v.name()), "it lists attributes, but no attribute can name it");
         if (!list.ids.empty())
             groups.push_back(std::move(list));
     }
@@ -192,7 +192,7 @@ void plan_variable_classes(std::vector<class_plan> &classes, const cdb::database
     std::transform(groups.begin(), groups.end(), lists.begin(), [](const group &g) { return g.ids; });
     auto dealt = deal_out(ids, lists);
     if (!dealt)
-        no_source("variable classes", "their lists of IDs do not follow from the dynamic attributes");
+        no_source("variable classes", "their lists of IDs are not those that the dynamic attributes give");
     for (std::size_t i = 0; i < members.size(); ++i)
         if (std::optional<std::size_t> list = (*dealt)[i])
             classes[members[i].of_class].of(members[i].level)[members[i].index].variable_class = groups[*list].name;

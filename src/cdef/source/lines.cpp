@@ -58,7 +58,7 @@ std::string permission_text(std::uint32_t mask, const std::string &place) {
         return std::string(NO_PERMISSION);
     char letter = permission_letter(mask);
     if (letter == '\0')
-        no_source(place, "no permission letter stands for " + std::to_string(mask));
+        no_source(place, "no permission letter has the value " + std::to_string(mask));
     return {letter};
 }
 
@@ -179,7 +179,7 @@ std::string properties_text(std::uint32_t bits, std::span<const props_t> known, 
     std::uint32_t unknown =
         take_properties(bits, known, [&](const char *name) { names.append(names.empty() ? "" : ",").append(name); });
     if (unknown != 0)
-        no_source(place, "no property has bit " + std::to_string(unknown));
+        no_source(place, "its properties contain an unknown bit: " + std::to_string(unknown));
     return names;
 }
 
@@ -187,7 +187,7 @@ void write_plain_line(source_writer &out, const stanza_line &line, const stanza_
     if (!language::fills(*line.attribute, *line.fact))
         return;
     if (!is_plain(line))
-        no_source(from.place, "nothing writes its " + std::string(line.attribute->ta_name));
+        no_source(from.place, "no line can give its " + std::string(line.attribute->ta_name));
     if (std::optional<std::string> text = plain_text(line, from))
         out.line(line.attribute->ta_name, *text);
 }

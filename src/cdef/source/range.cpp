@@ -313,7 +313,7 @@ void plan_ranges(std::vector<class_plan> &classes) {
     std::transform(classes.begin(), classes.end(), attributes.begin(), attributes_of);
     auto lines = find_range_lines(attributes);
     if (!lines)
-        no_source("dynamic attributes", "no choice of Range lines gives all of them their bounds");
+        no_source("dynamic attributes", "no combination of Range lines gives all of them their bounds");
     for (std::size_t c = 0; c < classes.size(); ++c)
         use((*lines)[c], classes[c]);
 }

@@ -33,7 +33,7 @@ std::uint32_t given_properties(std::uint32_t bits, bool cut_short, const std::st
     if (cut_short || (bits & (REQD_FOR_DEFINE | OPT_FOR_DEFINE)) != 0)
         return bits;
     if ((bits & INVAL_FOR_DEFINE) == 0)
-        no_source(place, "one of ReqdForDefine, OptForDefine and InvalForDefine is always set");
+        no_source(place, "none of ReqdForDefine, OptForDefine and InvalForDefine is set, which no source can do");
     return bits & ~INVAL_FOR_DEFINE;
 }
 
@@ -96,9 +96,9 @@ private:
 
     void require_type_and_varieties() const {
         if (!cut_short && !is_complete(attr))
-            no_source(from.place, "no type or no varieties");
+            no_source(from.place, "it has no data type or no varieties, which a source must give");
         if (!cut_short && attr.type() == VX_SBS_PTR)
-            no_source(from.place, "a type without values");
+            no_source(from.place, "its data type has no values");
     }
 
     void write_variety_lines() {
@@ -139,7 +139,7 @@ private:
         if (none || (!cut_short && is_default(value)))
             return;
         if (cut_short || at.from == table::persistent_class_attributes)
-            no_source(from.place, "no line sets its value");
+            no_source(from.place, "it has a value, which no line can set");
         write_value_lines(DYNAMIC ? "InitialValue" : "DefaultValue", value);
     }
 
@@ -149,7 +149,7 @@ private:
             return out.line_of_any(name, texts_of(value, false));
         std::size_t count = value.elements().size();
         if (count == 0 || (DYNAMIC && count != 1))
-            no_source(from.place, "no lines give an array of " + std::to_string(count) + " elements");
+            no_source(from.place, "no lines can give an array of " + std::to_string(count) + " elements");
         for (const cdb::value &element : value.elements())
             out.line_of_any(name, texts_of(element, false));
     }
@@ -159,7 +159,7 @@ private:
         bool more = std::any_of(optional.begin(), optional.end(),
                                 [&](const stanza_line &l) { return is_plain(l) && !is_default(l, from); });
         if (more || !own_valid_values().empty())
-            no_source(from.place, "optional lines, but no type or no varieties");
+            no_source(from.place, "it has optional attributes, which can only follow a data type and varieties");
         write_value();
     }
 
@@ -174,7 +174,7 @@ private:
         if (cdb::element_type(attr.type()) == VX_SD_PTR)
             write_structure(out, s, from.place);
         else if (!s.definition.empty() || s.highest_index != NO_SD_INDEX)
-            no_source(from.place, "a structure, but it is of another type");
+            no_source(from.place, "it has a structure, but its data type is not SD");
     }
 
     bool is_last_step() const {
@@ -215,7 +215,7 @@ private:
     void write_variety_lines() {
         write_varieties(out, action.varieties());
         if (action.varieties().empty())
-            no_source(from.place, "no varieties");
+            no_source(from.place, "it has no varieties, which a source must give");
     }
 
     void write_runs() {

@@ -25,7 +25,7 @@ bool same_types(const std::vector<vx_data_type_t> &types, const cdb::sd_definiti
 void require_types(const cdb::sd_definition &definition, bool makes_value, const std::string &place) {
     for (const cdb::sd_element &e : definition) {
         if (cdb::element_type(e.type()) == VX_SD_PTR || (makes_value && !has_default(e.type())))
-            no_source(place, "an element of type " + std::string(cdb::name_of(e.type())));
+            no_source(place, "it has an element of type " + std::string(cdb::name_of(e.type())));
     }
 }
 
@@ -85,7 +85,7 @@ void write_indexed_run(source_writer &out, std::string_view stanza, const cdb::s
         cdb::sd_element e = definition[i];
         cdb::valid_value_list values = e.valid_values();
         if (stanza == "ActionOutSDDefinition" && !values.empty())
-            no_source(place, "an element of a response has no valid values");
+            no_source(place, "it has valid values, which an element of a response cannot have");
         std::optional<std::size_t> given = indexed[i] ? std::optional(index++) : std::nullopt;
         element_writer(out, e.name(), e.record(), values, given).write(stanza, place);
     }
@@ -106,7 +106,7 @@ void write_replaced_run(source_writer &out, const attribute_structure &s, const 
 std::size_t require_indices(std::size_t elements, std::uint16_t highest, const std::string &place) {
     std::optional<std::size_t> given = indices_given(elements, highest);
     if (!given)
-        no_source(place, "fewer elements than its highest ElementIndex says");
+        no_source(place, "it has fewer elements than its highest ElementIndex says");
     return *given;
 }
 
@@ -125,7 +125,7 @@ void write_late_run(source_writer &out, const attribute_structure &s, const elem
     if (value.found)
         write_replaced_run(out, s, value, require_indices(value.types.size(), s.highest_index, place), place);
     else if (s.highest_index != NO_SD_INDEX)
-        no_source(place, "a highest ElementIndex without a value");
+        no_source(place, "it has a highest ElementIndex, but no value");
     out.comment("The run ends the file: it comes too late for the value of its attribute.");
     write_run(out, s.stanza, s.definition, place);
 }
@@ -146,9 +146,9 @@ void write_structure(source_writer &out, const attribute_structure &s, const std
     require_types(s.definition, true, place);
     element_types value = types_of(s.value);
     if (!value.defaults)
-        no_source(place, "no line sets the values of its structure");
+        no_source(place, "its structure has values, which no line can set");
     if (s.definition.empty() && (value.found || s.highest_index != NO_SD_INDEX))
-        no_source(place, "a structure's value without its definition");
+        no_source(place, "it has a structure's value, but no definition");
     if (s.definition.empty())
         return;
     if (fits_definition(s.definition, value, s.highest_index))
@@ -156,7 +156,7 @@ void write_structure(source_writer &out, const attribute_structure &s, const std
     else if (s.ends_file)
         write_late_run(out, s, value, place);
     else
-        no_source(place, "its value is not of its definition");
+        no_source(place, "its value does not match its definition");
 }
 
 } // namespace cdef::source

@@ -178,7 +178,7 @@ def test_case(programs, name):
 # ---- What no case shows ----------------------------------------------------------------
 
 WRONG_CHECKSUM = "cdef: {}: wrong checksum\n"
-NOT_ZERO = "cdef: {}: reserved bytes or filling not zero\n"
+NOT_ZERO = "cdef: {}: reserved bytes or padding not zero\n"
 MAP = base().partition("ClassToManagerMapping\n")[2]
 
 

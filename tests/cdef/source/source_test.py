@@ -202,13 +202,13 @@ def check_sections(programs):
     problems = []
     for order in make_images.ORDERS:
         plain = make_images.assemble(TESTS / "image" / "hash.image", order)
-        problems += refusals(programs, order, plain, "section 0: no source makes one of type 7")
+        problems += refusals(programs, order, plain, "section 0: no source compiles to a section of type 7")
         unused = make_images.assemble(TESTS / "image" / "sections.image", order)
-        problems += refusals(programs, order, unused, "section 1: no source makes one of type 0")
+        problems += refusals(programs, order, unused, "section 1: no source compiles to a section of type 0")
         revised = bytearray(make_images.assemble(TESTS / "image" / "small.image", order))
         make_images.change(revised, "put", "u32 92 3", order)  # the first anchor's
         make_images.settle(revised, order, [])
-        problems += refusals(programs, order, revised, "section 0: no source gives it a revision")
+        problems += refusals(programs, order, revised, "section 0: it has a revision, which no source can set")
     return problems
 
 
@@ -240,7 +240,7 @@ def check_optional_fields(programs):
     problems = []
     for kind, fields in ((PERSISTENT, OPTIONAL), (DYNAMIC, OPTIONAL + CONDITIONS)):
         stanza = "Persistent" if kind is PERSISTENT else "Dynamic"
-        why = f"{stanza}ResourceAttribute 'A': optional lines, but no type or no varieties"
+        why = f"{stanza}ResourceAttribute 'A': it has optional attributes, which can only follow a data type and varieties"
         for order in make_images.ORDERS:
             database = cdb_image.assemble(CUT_SHORT.format(field="", **kind), order, base_dir=TESTS / "golden")
             with tempfile.TemporaryDirectory() as name:
@@ -284,7 +284,7 @@ def check_choices_that_never_end(programs):
     for i, numbers in enumerate(lists):
         text += f"section varclass\nrsrc_variable_class_t:4 rvc_var_count={len(numbers)} u_rvc_string_tbl=8"
         text += f' u_rvc_compat_name=none\nstring "V{i}"\nvar_ids {" ".join(map(str, numbers))}\n'
-    why = "variable classes: their lists of IDs do not follow from the dynamic attributes"
+    why = "variable classes: their lists of IDs are not those that the dynamic attributes give"
     database = cdb_image.assemble(text, base_dir=TESTS / "golden")
     return refusals(programs, "choices", database, why)
 
@@ -303,7 +303,7 @@ def check_too_many_mixtures(programs):
         result = programs.source(pathlib.Path(name), few)
     if (result.returncode, result.stdout.count(b"\tRange=5,6\n"), result.stderr) != (0, 1, b""):
         problems.append(f"few: {result}")
-    why = "dynamic attributes: no choice of Range lines gives all of them their bounds"
+    why = "dynamic attributes: no combination of Range lines gives all of them their bounds"
     return problems + refusals(programs, "many", many, why)
 
 

@@ -32,7 +32,7 @@ CARELESS_LINE = (
 OF_THE_FILE = "broken/CDB102-one-less.little.cdef"
 OF_THE_FILE_LINE = (
     "{}: error: file, orb_cdb_header_t 0, cdb_hdr_length at offset 0: "
-    "length in the header is not the file's size less 4: found 1487, expected 1488 [CDB102]\n"
+    "length in the header is not the file's size minus 4: found 1487, expected 1488 [CDB102]\n"
 )
 SOUND = "small.little.cdef"
 WRONG_FINDING = {

@@ -41,9 +41,11 @@ constexpr row rows[] = {
       "Save the source with newlines only."},
      make_carriage_return},
     {{TEXT_AFTER_QUOTE, "S520", "text-after-quote", "text follows the quote that seems to end a value",
-      "A value in quotes contains another quote, with text after it.",
-      "Remove the inner quote, or turn the warning off if it is intended. A backslash before the quote avoids the "
-      "warning too, but is stored with the text."},
+      "A value in quotes contains a quote that makes no pair with another one, with text after it.",
+      "Remove it if it is not part of the value. A value that is to begin and end with quotes needs a second pair of "
+      "them: `\"\"a\" == \"b\"\"`. Any other value that contains quotes needs none around it: leave the outer ones "
+      "off. "
+      "A backslash in front of a quote is stored with it."},
      make_text_after_quote},
     {{NUMBER_TEXT, "S510", "number-text", "a number is followed by text, or there is none",
       "Text after a number is ignored; or there is no number and 0 is stored, as for a part of `1..2`.",

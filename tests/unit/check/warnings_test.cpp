@@ -55,6 +55,15 @@ TEST(CarriageReturn, IsReportedOnce) {
 
 /* ---- Values ---------------------------------------------------------------------------------------------------- */
 
+TEST(TextAfterQuote, IsNotReportedOfQuotesInPairs) {
+    for (const char *value : {"user == \"root\"", "a == \"\"", "(b=\"x\")", "\"x\" == \"A\""})
+        EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", std::string("\tDefaultValue=\"") + value + "\"\n")),
+                  codes())
+            << value;
+    EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tDefaultValue=\"x\" == \"A\"\n")),
+              codes{"S520 23:17+7"});
+}
+
 TEST(TextAfterQuote, IsReportedFromTheQuote) {
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tDefaultValue=\"a\"b\"\n")), codes{"S520 23:17+2"});
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "String", "\tDefaultValue=\"a\\\"b\"\n")), codes());

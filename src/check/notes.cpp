@@ -114,7 +114,7 @@ void repeated(noting &n) {
 }
 
 void no_sd_attribute(noting &n) {
-    n.add_here("it must follow an attribute whose DataType is `SD` or `SDArray` at once");
+    n.add_here("it must directly follow an attribute whose DataType is `SD` or `SDArray`");
 }
 
 void incomplete(noting &n) {

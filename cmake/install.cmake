@@ -4,7 +4,7 @@ include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
 
 set(package_dir "${CMAKE_INSTALL_LIBDIR}/cmake/cdgen")
-set(headers vx.h cdb.h cdb_fields.h cdb_view.h)
+set(headers vx.h cdb.h cdb_fields.h cdb_values.h cdb_sections.h cdb_view.h)
 list(TRANSFORM headers PREPEND "${PROJECT_SOURCE_DIR}/include/")
 
 set(programs cdgen)

@@ -16,7 +16,7 @@ def compiled(directory, header, standard):
     return done.returncode, done.stderr
 
 
-@pytest.mark.parametrize("header", ["cdb_fields.h", "cdb_view.h"])
+@pytest.mark.parametrize("header", ["cdb_fields.h", "cdb_values.h", "cdb_sections.h", "cdb_view.h"])
 def test_asks_for_the_standard_that_it_needs(header, directory):
     """One message that names it, and not many about words that the compiler does not know."""
     status, said = compiled(directory, header, "c++17")

@@ -31,7 +31,7 @@ size_t count_of(const std::string &all, const std::string &text) {
     return count;
 }
 
-class StrayRange : public testing::TestWithParam<const char *> {
+class CompilesSources : public testing::Test {
 protected:
     void SetUp() override {
         directory = std::filesystem::temp_directory_path() / ("cdgen-stray-" + std::to_string(getpid()));
@@ -53,6 +53,8 @@ protected:
 
     std::filesystem::path directory;
 };
+
+class StrayRange : public CompilesSources, public testing::WithParamInterface<const char *> {};
 
 std::uint32_t word_at(const std::string &image, size_t at) {
     std::uint32_t word = 0;
@@ -112,5 +114,23 @@ TEST_P(StrayArrayRange, IsReversedAsTheRecordSays) {
 }
 
 INSTANTIATE_TEST_SUITE_P(Types, StrayArrayRange, testing::Values("StringArray", "BinaryArray", "SDArray", "RHArray"));
+
+class StrayWideRange : public CompilesSources {};
+
+/* A number of 32 bits fills half a cell; a record of 64-bit numbers has the whole cell reversed. */
+TEST_F(StrayWideRange, IsReversedInTheWidthOfTheRecord) {
+    constexpr size_t CLASS = 80 + 16 * 3;
+    constexpr size_t BOUND = CLASS + sizeof(rsrc_class_t) + sizeof(rsrc_dattr_t) + offsetof(rsrc_dattr_t, ra_min_value);
+    for (const char *type : {"Int64Array", "Float64Array"}) {
+        std::string source = HEAD + attribute("DynamicResourceAttribute", type, "") +
+                             attribute("DynamicClassAttribute", "Int32Array", "\tRange=16909060,16\n") + TAIL;
+        std::string native = compiled(source, "-n"), turned = compiled(source, "-s");
+        size_t array = CLASS + word_at(native, CLASS + offsetof(rsrc_class_t, u_rc_strings)) + word_at(native, BOUND);
+        std::string cell = native.substr(array + 8, 8);
+        EXPECT_EQ(word_at(cell, 0), 16909060U);
+        EXPECT_EQ(turned.substr(array, 4), turned_word(native, array));
+        EXPECT_EQ(turned.substr(array + 8, 8), std::string(cell.rbegin(), cell.rend()));
+    }
+}
 
 } // namespace

@@ -19,9 +19,8 @@ public:
     int &line_of(std::string_view text) {
         return line_of(text, tag_of(text));
     }
-    /* A number is its own tag: numbers mostly ascend, and so their slots are close together. */
     int &line_of(vx_uint32_t number) {
-        return line_of(text_of_number(number), number);
+        return line_of(text_of_number(number), tag_of(number));
     }
     bool has(std::string_view text) const {
         return find(text) != 0;
@@ -31,7 +30,7 @@ public:
         return find(text, tag_of(text));
     }
     int find(vx_uint32_t number) const {
-        return find(text_of_number(number), number);
+        return find(text_of_number(number), tag_of(number));
     }
     /* All texts, in the order in which they came; valid until the next one is added. */
     std::vector<std::string_view> all() const;
@@ -51,6 +50,13 @@ private:
     static unsigned tag_of(std::string_view text) {
         constexpr int LOWER = std::numeric_limits<size_t>::digits - std::numeric_limits<unsigned>::digits;
         return static_cast<unsigned>(std::hash<std::string_view>()(text) >> LOWER);
+    }
+    /* Numbers mostly ascend: the slots of eight are close together. Those of more would be searched in vain one after
+     * the other for a number that is not there. */
+    static unsigned tag_of(vx_uint32_t number) {
+        constexpr unsigned NEAR_BITS = 3, MIX = 0x9E3779B1, SHIFT = 15;
+        unsigned mixed = (number >> NEAR_BITS) * MIX;
+        return ((mixed ^ mixed >> SHIFT) << NEAR_BITS) | (number & ((1u << NEAR_BITS) - 1));
     }
     static std::string_view text_of_number(const vx_uint32_t &number) {
         return {reinterpret_cast<const char *>(&number), sizeof number};

@@ -71,9 +71,21 @@ std::optional<value_key> default_key(vx_data_type_t type) {
 }
 
 key_ranges::range key_ranges::add(range given) {
-    range earlier;
     if (given.high < given.low)
-        return earlier;
+        return {};
+    if (empty()) {
+        single = std::move(given);
+        return {};
+    }
+    if (single) {
+        add_to_map(std::move(*single));
+        single.reset();
+    }
+    return add_to_map(std::move(given));
+}
+
+key_ranges::range key_ranges::add_to_map(range given) {
+    range earlier;
     auto after = by_low.upper_bound(given.high);
     while (after != by_low.begin()) {
         auto each = std::prev(after);
@@ -90,6 +102,8 @@ key_ranges::range key_ranges::add(range given) {
 }
 
 bool key_ranges::has(const value_key &key) const {
+    if (single)
+        return single->low <= key && key <= single->high;
     auto after = by_low.upper_bound(key);
     return after != by_low.begin() && key <= std::prev(after)->second.high;
 }

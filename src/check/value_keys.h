@@ -42,10 +42,12 @@ public:
     range add(range given);
     bool has(const value_key &key) const;
     bool empty() const {
-        return by_low.empty();
+        return !single && by_low.empty();
     }
     void clear() {
-        by_low.clear();
+        single.reset();
+        if (!by_low.empty())
+            by_low.clear();
     }
 
 private:
@@ -54,6 +56,9 @@ private:
         int line;
     };
 
+    range add_to_map(range given);
+
+    std::optional<range> single; /* the only range: most stanzas have one, which needs no memory of its own */
     std::map<value_key, rest> by_low;
 };
 

@@ -96,6 +96,7 @@ public:
     static constexpr std::array types = {AT_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE, AT_RANGE, AT_PATTR_PROPS};
 
     void value(const view &see) override {
+        touched = true;
         vx_data_type_t type = see.compiler.data_type();
         switch (see.attr().ta_type) {
         case AT_VALID_VALUE:
@@ -113,6 +114,8 @@ public:
     }
 
     void stanza_end(const view &see, int) override {
+        if (!touched)
+            return;
         if ((valid.line != 0 || range.line != 0) && !see.known.stanza().may_have_lost({AT_VALID_VALUE, AT_RANGE})) {
             look_at_given(see.compiler.data_type());
             look_at_implied(see);
@@ -120,7 +123,7 @@ public:
         valid.clear();
         range.clear();
         defaults.clear();
-        has_default = is_required = false;
+        touched = has_default = is_required = false;
     }
 
 private:
@@ -174,6 +177,7 @@ private:
 
     allowed_values valid, range;
     kept_lines defaults;
+    bool touched = false; /* the stanza has any of these attributes */
     bool has_default = false;
     bool is_required = false; /* whoever defines a resource must give it */
 };

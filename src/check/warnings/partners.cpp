@@ -71,7 +71,8 @@ public:
         std::string_view name = see.attr().ta_name;
         if (name == "GroupName") {
             group_name = number_in(see);
-            name_line = {see.name_place(), std::string(see.value()), std::string(see.line.raw)};
+            name_line.at = see.name_place();
+            name_line.source = see.line.raw;
         }
         if (name != "GroupID")
             return;
@@ -156,7 +157,8 @@ public:
 
     void value(const view &see) override {
         constexpr long CLASS_BIT = 0x8000;
-        if (table_of(see.known.kind).sc_attr == nullptr)
+        const attr_kind *kind = table_of(see.known.kind).sc_attr;
+        if (kind == nullptr || kind->sd_attr_type == 0)
             return;
         if (see.attr().ta_type == AT_ID && (check::number(see.value(), 0).value & CLASS_BIT) != 0)
             id = see.value_mention();

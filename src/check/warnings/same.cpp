@@ -61,17 +61,8 @@ public:
             return;
         int first = earlier(see);
         int without_case = earlier_without_case(see);
-        std::optional<int> partner = partner_of(kind);
-        int of_partner = partner ? see.known.declared.names[index_of(*partner)].find(see.value()) : 0;
-        if (first != 0)
-            advise(report(see, see.value_place(), another(kind, "name"), first_given(first)), "rename one of them");
-        else if (of_partner != 0)
-            advise(report(see, see.value_place(), partner_has(*partner, "name"), first_given(of_partner)),
-                   "rename one of them");
-        else if (without_case != 0)
-            advise(report(see, see.value_place(), "this name differs from another one only in case",
-                          {{without_case, 0, 0}, "the other one"}),
-                   "rename one of them, or spell them alike if they are meant to be one");
+        if (first != 0 || without_case != 0)
+            look_at(see, first, without_case);
     }
 
     /* Elements are named within their run, and all but variable classes within their class. */
@@ -88,6 +79,20 @@ public:
     }
 
 private:
+    void look_at(const view &see, int first, int without_case) {
+        int kind = see.known.kind;
+        std::optional<int> partner = partner_of(kind);
+        int of_partner = partner ? see.known.declared.names[index_of(*partner)].find(see.value()) : 0;
+        if (first != 0)
+            advise(report(see, see.value_place(), another(kind, "name"), first_given(first)), "rename one of them");
+        else if (of_partner != 0)
+            advise(report(see, see.value_place(), partner_has(*partner, "name"), first_given(of_partner)),
+                   "rename one of them");
+        else
+            advise(report(see, see.value_place(), "this name differs from another one only in case",
+                          {{without_case, 0, 0}, "the other one"}),
+                   "rename one of them, or spell them alike if they are meant to be one");
+    }
     /* The line that gave the current line's name first; 0: none did. */
     int earlier(const view &see) {
         if (see.known.kind != SC_RESOURCE_VARIABLE_CLASS)

@@ -27,22 +27,25 @@ char *find_equals(cdgen &cx, const attr_text &text) {
 name_value split_line(cdgen &cx, const attr_text &text, const table_attrs *known) {
     char *name = text.name;
     char *end = text.end;
-    cx.source.linepos = 1 + static_cast<int>(name - text.line);
-    if (name == end)
+    if (known == nullptr)
+        cx.source.linepos = 1 + static_cast<int>(name - text.line);
+    if (known == nullptr && name == end)
         return {};
     char *equals = known != nullptr ? name + known->ta_length : find_equals(cx, text);
     *equals = '\0';
     char *value = equals + 1;
-    if (value[0] == '"' && value[1] == '"' && value[2] == '\0')
-        return {};
-    char *unquoted = strip_quotes(value, &end);
-    if (unquoted == nullptr)
-        source_error(cx, MSG_UNMATCHED_QUOTES, name);
-    auto length = static_cast<size_t>(end - unquoted);
+    if (static_cast<unsigned char>(*value) <= '"') { /* an empty value, a quote or a blank; rarely another */
+        if (value[0] == '"' && value[1] == '"' && value[2] == '\0')
+            return {};
+        value = strip_quotes(value, &end);
+        if (value == nullptr)
+            source_error(cx, MSG_UNMATCHED_QUOTES, name);
+    }
+    auto length = static_cast<size_t>(end - value);
     if (length > VALUE_MAX_CHARS)
         source_error(cx, MSG_VALUE_TOO_LONG, name);
-    cx.source.linepos = 1 + static_cast<int>(unquoted - text.line);
-    return {{name, static_cast<size_t>(equals - name)}, unquoted, length};
+    cx.source.linepos = 1 + static_cast<int>(value - text.line);
+    return {{name, static_cast<size_t>(equals - name)}, value, length};
 }
 
 /* The attribute of that name, when it was not the expected one. */
@@ -98,6 +101,5 @@ void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, s
         count_optional(cx, scp, state, attr);
     else
         count_required(cx, state, attr);
-    cx.line_texts.clear();
     store_value({cx, scp, state, sc_cb(cx, scp), attr, value, length});
 }

@@ -29,7 +29,11 @@ template <class Value> void store(char *to, Value value) {
     memcpy(to, &value, sizeof value);
 }
 
-vx_int64_t integer(const attr_line &line, const char *text) {
+std::string_view value_of(const attr_line &line) {
+    return {line.value, line.length};
+}
+
+vx_int64_t integer(const attr_line &line, std::string_view text) {
     return int_from_text(line.cx, text, nullptr, 0);
 }
 
@@ -48,7 +52,7 @@ tbl *strings_of(const attr_line &line) {
 
 /* Deliberately truncated to the field's width, without a range check. */
 template <class Width> void store_integer(const attr_line &line) {
-    store(field_of(line), static_cast<Width>(integer(line, line.value)));
+    store(field_of(line), static_cast<Width>(integer(line, value_of(line))));
 }
 
 void store_string(const attr_line &line) {
@@ -98,10 +102,10 @@ void store_permission(const attr_line &line) {
 }
 
 void store_variable_type(const attr_line &line) {
-    orb_variable_type_t type = ORB_COUNTER;
-    if (strToVar(line.value, &type) != 0)
+    std::optional<orb_variable_type_t> type = variable_type_named(value_of(line));
+    if (!type)
         source_error(line.cx, MSG_INVALID_VARIABLE_TYPE);
-    store(field_of(line), type);
+    store(field_of(line), *type);
 }
 
 /* The name is kept for the manager's record, made at the end; the map refers to manager 0, the only one. */
@@ -124,9 +128,19 @@ void ignore(const attr_line &) {}
 
 /* ---- Varieties and valid values -------------------------------------------------------------------------------- */
 
-/* Splits "low,high" in place; null without a comma. */
-char *after_comma(const attr_line &line) {
-    return getNextArrVal(line.value);
+/* The two values of "low,high". */
+struct bounds {
+    std::string_view low;
+    std::string_view high;
+};
+
+/* Splits the value at its first comma, in place; nothing without a comma. */
+std::optional<bounds> split_bounds(const attr_line &line) {
+    char *high = getNextArrVal(line.value);
+    if (high == nullptr)
+        return std::nullopt;
+    auto low_length = static_cast<size_t>(high - 1 - line.value);
+    return bounds{{line.value, low_length}, {high, line.length - low_length - 1}};
 }
 
 /* The offset of a list's next entry: the first one has its room in the list's header, each other one goes to the end of
@@ -140,24 +154,24 @@ size_t next_entry(cdgen &cx, tbl *t, size_t list, vx_uint32_t List::*count, size
 }
 
 void store_variety(const attr_line &line) {
-    char *high = after_comma(line);
-    if (high == nullptr)
+    std::optional<bounds> given = split_bounds(line);
+    if (!given)
         source_error(line.cx, MSG_INVALID_VARIETY);
     tbl *varieties = sc_vty_tbl(line.cx, line.scp);
     auto list = load<vx_uint32_t>(field_of(line));
     size_t at = next_entry(line.cx, varieties, list, &variety_list_t::vl_count, offsetof(variety_list_t, vl_values),
                            sizeof(vl_entry_t));
     char *rest = nullptr;
-    auto high_val = static_cast<vx_uint32_t>(int_from_text(line.cx, high, &rest, 0));
+    auto high_val = static_cast<vx_uint32_t>(int_from_text(line.cx, given->high, &rest, 0));
     if (*rest != '\0' && strchr(rest, ',') != nullptr)
         source_error(line.cx, MSG_TOO_MANY_VARIETIES);
-    auto low_val = static_cast<vx_uint32_t>(integer(line, line.value));
+    auto low_val = static_cast<vx_uint32_t>(integer(line, given->low));
     *record_at<vl_entry_t>(varieties, at) = {low_val, high_val};
     ++record_at<variety_list_t>(varieties, list)->vl_count;
 }
 
 /* Converts a text to a value that waits in the line's pool. */
-vx_value_t converted(const attr_line &line, vx_data_type_t type, const char *text) {
+vx_value_t converted(const attr_line &line, vx_data_type_t type, std::string_view text) {
     vx_value_t value = {};
     if (str_to_vx(line.cx, &value, type, text, line.cx.line_texts) != 0)
         source_error(line.cx, MSG_INVALID_VALUE);
@@ -176,11 +190,11 @@ constexpr message_id DATA_ERROR = MSG_INVALID_VALUE;
 
 /* With a comma, high then low; without one, one value that is written twice, low then high. */
 void store_bounds(const attr_line &line, vx_data_type_t type, vv_entry_t *entry) {
-    if (char *high = after_comma(line)) {
-        copied(line, &entry->vv_high_val, converted(line, type, high), type, COPY_ERROR);
-        copied(line, &entry->vv_low_val, converted(line, type, line.value), type, DATA_ERROR);
+    if (std::optional<bounds> given = split_bounds(line)) {
+        copied(line, &entry->vv_high_val, converted(line, type, given->high), type, COPY_ERROR);
+        copied(line, &entry->vv_low_val, converted(line, type, given->low), type, DATA_ERROR);
     } else {
-        vx_value_t value = converted(line, type, line.value);
+        vx_value_t value = converted(line, type, value_of(line));
         copied(line, &entry->vv_low_val, value, type, COPY_ERROR);
         copied(line, &entry->vv_high_val, value, type, COPY_ERROR);
     }
@@ -194,6 +208,7 @@ void add_valid_value(const attr_line &line) {
     size_t at =
         next_entry(cx, lists, list, &valid_values_t::vv_count, offsetof(valid_values_t, vv_values), sizeof(vv_entry_t));
     vv_entry_t entry = {};
+    cx.line_texts.clear();
     store_bounds(line, scalar_vx(data_type(line)), &entry);
     *record_at<vv_entry_t>(lists, at) = entry;
     cx.valid_values.vvdisp = at + offsetof(vv_entry_t, vv_disp_msgid);
@@ -214,7 +229,7 @@ void store_value_display(const attr_line &line) {
     if (!cx.valid_values.vvdisp.has_value())
         source_error(cx, MSG_NO_VALID_VALUE);
     *record_at<vx_uint16_t>(sc_vv_tbl(cx, line.scp), *cx.valid_values.vvdisp) =
-        static_cast<vx_uint16_t>(integer(line, line.value));
+        static_cast<vx_uint16_t>(integer(line, value_of(line)));
 }
 
 /* ---- Data types, defaults and ranges --------------------------------------------------------------------------- */
@@ -241,7 +256,7 @@ void store_default(const attr_line &line) {
         dflt.tbl = new_dflt_values(cx, "DefaultValues");
     void *slot = alloc_tble(cx, &dflt.tbl->cells, sizeof(vx_value_t));
     vx_value_t value = {};
-    if (str_to_vx(cx, &value, type, line.value, dflt.tbl->texts) != 0)
+    if (str_to_vx(cx, &value, type, value_of(line), dflt.tbl->texts) != 0)
         source_error(cx, MSG_INVALID_VALUE);
     memcpy(slot, &value, sizeof value);
     ++dflt.num_elems;
@@ -258,7 +273,7 @@ void expect_sd_run(const attr_line &line, vx_data_type_t type) {
 }
 
 void store_data_type(const attr_line &line) {
-    vx_data_type_t type = strToVxDt(line.value);
+    vx_data_type_t type = data_type_named(value_of(line));
     store(field_of(line), type);
     if (type == VX_UNKNOWN)
         source_error(line.cx, MSG_INVALID_DATA_TYPE);
@@ -280,15 +295,16 @@ void store_range(const attr_line &line) {
     if (!takes_range(type))
         return;
     cx.range.dattr_range_found = 1;
-    char *max = after_comma(line);
-    if (max == nullptr)
+    std::optional<bounds> given = split_bounds(line);
+    if (!given)
         source_error(cx, MSG_RANGE_NEEDS_TWO);
     bool of_resource = cx.staged.cb_rsrc_dattr.ra_cb_ID != 0;
     rsrc_dattr_t &target = of_resource ? cx.staged.cb_rsrc_dattr : cx.staged.cb_rsrc_dattrC;
     if (of_resource)
         cx.range.dattr_range_type = type;
-    copied(line, &target.ra_max_value, converted(line, type, max), type, COPY_ERROR);
-    copied(line, &target.ra_min_value, converted(line, type, line.value), type, DATA_ERROR);
+    cx.line_texts.clear();
+    copied(line, &target.ra_max_value, converted(line, type, given->high), type, COPY_ERROR);
+    copied(line, &target.ra_min_value, converted(line, type, given->low), type, DATA_ERROR);
 }
 
 /* ---- Elements of structured data ------------------------------------------------------------------------------- */
@@ -313,7 +329,7 @@ void store_sd_display(const attr_line &line) {
 void check_sd_index(const attr_line &line) {
     cdgen &cx = line.cx;
     vx_value_t index = {};
-    if (str_to_vx(cx, &index, VX_UINT32, line.value, cx.line_texts) == 0)
+    if (str_to_vx(cx, &index, VX_UINT32, value_of(line), cx.line_texts) == 0)
         cx.sd.set_index(static_cast<int>(index.val_uint32));
     if (cx.sd.index() != cx.sd.expected_index()) {
         if (cx.options.explanations != nullptr)
@@ -327,7 +343,7 @@ void check_sd_index(const attr_line &line) {
 /* An unknown type is deliberately no error here. */
 void store_sd_data_type(const attr_line &line) {
     cdgen &cx = line.cx;
-    vx_data_type_t type = strToVxDt(line.value);
+    vx_data_type_t type = data_type_named(value_of(line));
     if (is_sd(type))
         source_error(cx, MSG_SD_IN_SD);
     store(field_of(line), type);

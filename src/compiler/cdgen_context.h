@@ -40,7 +40,7 @@ struct cdgen {
     valid_value_lists valid_values;
     range_state range;
     sd_run sd;
-    text_pool line_texts; /* out-of-line values of the current line */
+    text_pool line_texts; /* out-of-line values of the latest line that has such values and serialises them at once */
     /* errno as the number conversions see it. Nothing clears it: after an overflow, every later 0 or limit value is
      * refused. Existing sources rely on this. */
     int conv_errno = 0;

@@ -76,10 +76,10 @@ void begin_plain_stanza(cdgen &cx) {
     cx.sd.forget_owner();
 }
 
-void begin_stanza(cdgen &cx, const char *name) {
+void begin_stanza(cdgen &cx, std::string_view name) {
     cx.framing.table_id = set_table_id(name);
     if (cx.framing.table_id < 0)
-        source_error(cx, MSG_UNKNOWN_STANZA, name);
+        source_error(cx, MSG_UNKNOWN_STANZA, name.data());
     cx.framing.prev_scp = cx.framing.scp;
     cx.framing.scp = cx.framing.curr_sd_scp = &sc_tables[static_cast<size_t>(cx.framing.table_id)];
     cx.framing.state = &state_of(cx, cx.framing.scp);
@@ -93,7 +93,7 @@ void begin_stanza(cdgen &cx, const char *name) {
 
 void take_line(cdgen &cx, const attr_text &text) {
     if (text.name == text.line)
-        begin_stanza(cx, text.name);
+        begin_stanza(cx, {text.name, static_cast<size_t>(text.end - text.name)});
     else if (cx.framing.table_id < 0)
         source_error(cx, MSG_NO_STANZA);
     else

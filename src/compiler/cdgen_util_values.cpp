@@ -3,17 +3,31 @@
 #include "compiler/cdgen_values.h"
 
 #include "compiler/cdgen_context.h"
+#include "compiler/cdgen_digits.h"
 #include "language/name_index.h"
+#include "language/same_bytes.h"
 
+#include <algorithm>
+#include <array>
 #include <cerrno>
-#include <cfloat>
+#include <charconv>
+#include <cmath>
 #include <cstdlib>
 #include <limits>
 #include <string_view>
 
 namespace {
 
-constexpr name_index type_names(std::size(vxTypeStr), [](size_t i) { return std::string_view(vxTypeStr[i]); });
+/* Names with their lengths. */
+template <size_t Count> consteval auto with_lengths(const char *const (&names)[Count]) {
+    std::array<std::string_view, Count> views;
+    std::copy_n(names, Count, views.begin());
+    return views;
+}
+
+constexpr auto type_names = with_lengths(vxTypeStr);
+constexpr auto variable_names = with_lengths(vxVarStr);
+constexpr name_index type_index(type_names.size(), [](size_t i) { return type_names[i]; });
 
 /* A call into the C library's conversions with errno as they alone know it. */
 template <class Convert> auto converted(cdgen &cx, Convert convert) {
@@ -29,53 +43,27 @@ bool conversion_failed(const cdgen &cx) {
     return cx.conv_errno == ERANGE || cx.conv_errno == EINVAL;
 }
 
-/* More than 9 if the character is not a decimal digit. */
-unsigned digit_of(char c) {
-    return static_cast<unsigned>(c) - '0';
-}
-
-/* Plain decimal text of at most 18 digits, as most numbers are: the C library's result without calling it. Null
- * where its rules are wanted. */
-const char *plain_decimal(const char *text, vx_uint64_t *value) {
-    constexpr int SAFE_DIGITS = 18;
-    const char *p = text;
-    vx_uint64_t n = 0;
-    for (unsigned digit = 0; (digit = digit_of(*p)) <= 9; ++p)
-        n = n * 10 + digit;
-    if (p == text || p - text > SAFE_DIGITS)
-        return nullptr;
-    *value = n;
-    return p;
+/* Digits alone, of a number that fits: the C library's result without calling it. False where its rules are wanted. */
+bool plain_unsigned(std::string_view text, vx_uint64_t *value) {
+    return all_digits(text, value);
 }
 
 /* The same with a minus sign in front, or without. */
-const char *plain_signed(const char *text, vx_int64_t *value) {
-    bool negative = *text == '-';
-    vx_uint64_t n = 0;
-    const char *end = plain_decimal(text + negative, &n);
-    *value = negative ? -static_cast<vx_int64_t>(n) : static_cast<vx_int64_t>(n);
-    return end;
+bool plain_signed(std::string_view text, vx_int64_t *value) {
+    bool negative = text.starts_with('-');
+    vx_uint64_t size = 0;
+    bool plain = all_digits(text.substr(negative), &size);
+    *value = negative ? -static_cast<vx_int64_t>(size) : static_cast<vx_int64_t>(size);
+    return plain;
 }
 
-/* Digits with or without a fraction, such that they as an integer and the power of ten are exact: the one division
- * rounds as the C library does. False where its rules are wanted. */
-template <class Float> bool plain_fraction(const char *text, Float *value) {
-    constexpr vx_uint64_t EXACT = vx_uint64_t{1} << std::numeric_limits<Float>::digits;
-    constexpr int EXACT_POWER = sizeof(Float) == sizeof(float) ? 10 : 18; /* of ten; and no overflow of n */
-    bool negative = *text == '-';
-    vx_uint64_t n = 0;
-    const char *p = plain_decimal(text + negative, &n);
-    if (p == nullptr)
-        return false;
-    auto digits = p - text - negative;
-    Float scale = 1;
-    if (*p == '.')
-        for (unsigned digit = 0; (digit = digit_of(*++p)) <= 9; ++digits, scale *= 10)
-            n = n * 10 + digit;
-    Float size = static_cast<Float>(n) / scale;
-    *value = negative ? -size : size;
-    bool rounded_once = FLT_EVAL_METHOD == 0 || FLT_EVAL_METHOD == 1;
-    return rounded_once && *p == '\0' && n <= EXACT && digits <= EXACT_POWER;
+/* A decimal number that is normal, and so rounded as the C library rounds it. False where its rules are wanted: for
+ * white space, plus signs, hexadecimal numbers, and what it reports in errno. */
+template <class Float> bool plain_float(std::string_view text, Float *value) {
+    const char *end = text.data() + text.size();
+    auto [rest, error] = std::from_chars(text.data(), end, *value);
+    return rest == end && error == std::errc() && std::isnormal(*value) &&
+           std::abs(*value) > std::numeric_limits<Float>::min();
 }
 
 [[gnu::noinline]] vx_int64_t library_integer(cdgen &cx, const char *text, char **end, int base) {
@@ -83,28 +71,28 @@ template <class Float> bool plain_fraction(const char *text, Float *value) {
 }
 
 /* The whole text as a decimal integer: false when anything else follows. */
-bool whole_signed(cdgen &cx, const char *text, vx_int64_t *value) {
-    if (const char *end = plain_signed(text, value))
-        return *end == '\0';
+bool whole_signed(cdgen &cx, std::string_view text, vx_int64_t *value) {
+    if (plain_signed(text, value))
+        return true;
     char *end = nullptr;
-    *value = converted(cx, [&] { return strtoll(text, &end, 10); });
+    *value = converted(cx, [&] { return strtoll(text.data(), &end, 10); });
     return *end == '\0';
 }
 
-bool whole_unsigned(cdgen &cx, const char *text, vx_uint64_t *value) {
-    if (const char *end = plain_decimal(text, value))
-        return *end == '\0';
+bool whole_unsigned(cdgen &cx, std::string_view text, vx_uint64_t *value) {
+    if (plain_unsigned(text, value))
+        return true;
     char *end = nullptr;
-    *value = converted(cx, [&] { return strtoull(text, &end, 10); });
+    *value = converted(cx, [&] { return strtoull(text.data(), &end, 10); });
     return *end == '\0';
 }
 
 template <class Float>
-bool whole_float(cdgen &cx, const char *text, Float *value, Float (*convert)(const char *, char **)) {
-    if (plain_fraction(text, value))
+bool whole_float(cdgen &cx, std::string_view text, Float *value, Float (*convert)(const char *, char **)) {
+    if (plain_float(text, value))
         return true;
     char *end = nullptr;
-    *value = converted(cx, [&] { return convert(text, &end); });
+    *value = converted(cx, [&] { return convert(text.data(), &end); });
     return *end == '\0';
 }
 
@@ -121,7 +109,7 @@ template <class Float> bool suspicious_float(Float value) {
     return value == 0 || value >= limits::max() || value == limits::min();
 }
 
-int int32_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
+int int32_from_text(cdgen &cx, vx_value_t *out, std::string_view text, text_pool &) {
     vx_int64_t wide = 0;
     if (!whole_signed(cx, text, &wide))
         return -1;
@@ -132,7 +120,7 @@ int int32_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
     return 0;
 }
 
-int uint32_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
+int uint32_from_text(cdgen &cx, vx_value_t *out, std::string_view text, text_pool &) {
     vx_uint64_t wide = 0;
     if (!whole_unsigned(cx, text, &wide))
         return -1;
@@ -143,7 +131,7 @@ int uint32_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) 
     return 0;
 }
 
-int int64_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
+int int64_from_text(cdgen &cx, vx_value_t *out, std::string_view text, text_pool &) {
     vx_int64_t value = 0;
     if (!whole_signed(cx, text, &value) || (suspicious(value) && conversion_failed(cx)))
         return -1;
@@ -151,7 +139,7 @@ int int64_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
     return 0;
 }
 
-int uint64_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
+int uint64_from_text(cdgen &cx, vx_value_t *out, std::string_view text, text_pool &) {
     vx_uint64_t value = 0;
     if (!whole_unsigned(cx, text, &value) || (suspicious(value) && conversion_failed(cx)))
         return -1;
@@ -159,7 +147,7 @@ int uint64_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) 
     return 0;
 }
 
-int float32_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
+int float32_from_text(cdgen &cx, vx_value_t *out, std::string_view text, text_pool &) {
     float value = 0;
     if (!whole_float(cx, text, &value, strtof) || (suspicious_float(value) && conversion_failed(cx)))
         return -1;
@@ -167,7 +155,7 @@ int float32_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &)
     return 0;
 }
 
-int float64_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &) {
+int float64_from_text(cdgen &cx, vx_value_t *out, std::string_view text, text_pool &) {
     double value = 0;
     if (!whole_float(cx, text, &value, strtod) || (suspicious_float(value) && conversion_failed(cx)))
         return -1;
@@ -175,27 +163,26 @@ int float64_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &)
     return 0;
 }
 
-int string_from_text(cdgen &, vx_value_t *out, const char *text, text_pool &pool) {
-    size_t size = strlen(text) + 1;
-    char *copy = pool.take(size);
+int string_from_text(cdgen &, vx_value_t *out, std::string_view text, text_pool &pool) {
+    char *copy = pool.take(text.size() + 1);
     if (copy == nullptr)
         return -1;
-    memcpy(copy, text, size);
+    memcpy(copy, text.data(), text.size() + 1);
     out->ptr_char = copy;
     return 0;
 }
 
 /* Text that starts with 0 is hexadecimal and must have an x next; any other has escapes. The block is zeroed and large
  * enough for the bytes that a reader of the block takes from behind the escapes' decoded text. */
-int binary_from_text(cdgen &cx, vx_value_t *out, const char *text, text_pool &pool) {
-    char *block = pool.take(sizeof(vx_uint32_t) + strlen(text) + sizeof(vx_uint32_t));
+int binary_from_text(cdgen &cx, vx_value_t *out, std::string_view text, text_pool &pool) {
+    char *block = pool.take(sizeof(vx_uint32_t) + text.size() + sizeof(vx_uint32_t));
     if (block == nullptr)
         return -1;
     out->ptr_binary = reinterpret_cast<vx_binary_t *>(block);
-    return text[0] == '0' ? hex_convert(block, text) : oct_convert(cx, text, 2, block);
+    return text[0] == '0' ? hex_convert(block, text.data()) : oct_convert(cx, text.data(), 2, block);
 }
 
-using converter = int (*)(cdgen &, vx_value_t *, const char *, text_pool &);
+using converter = int (*)(cdgen &, vx_value_t *, std::string_view, text_pool &);
 
 /* By type, VX_INT32 to VX_BINARY_PTR. */
 constexpr converter converters[] = {int32_from_text,   uint32_from_text,  int64_from_text,  uint64_from_text,
@@ -223,6 +210,11 @@ vx_int64_t octal_escape(cdgen &cx, const char **p) {
     return end == digits ? 256 : value;
 }
 
+bool is_named(const props_t &property, std::string_view name) {
+    return name.size() < sizeof property.s && property.s[name.size()] == '\0' &&
+           language::same_bytes(property.s, name.data(), name.size());
+}
+
 void store_length(char *block, size_t length) {
     auto count = static_cast<vx_uint32_t>(length);
     memcpy(block, &count, sizeof count);
@@ -230,35 +222,31 @@ void store_length(char *block, size_t length) {
 
 } // namespace
 
-vx_data_type_t strToVxDt(const char *s) {
-    int at = s == nullptr ? -1 : type_names.candidate(s);
-    return at >= 0 && strcmp(s, vxTypeStr[at]) == 0 ? vxTypeMap[at] : VX_UNKNOWN;
+vx_data_type_t data_type_named(std::string_view name) {
+    int at = type_index.candidate(name);
+    return at >= 0 && language::same_text(type_names[static_cast<size_t>(at)], name) ? vxTypeMap[at] : VX_UNKNOWN;
 }
 
-int strToVar(const char *s, orb_variable_type_t *t) {
-    if (s != nullptr)
-        for (size_t i = 0; i < std::size(vxVarStr); ++i)
-            if (strcmp(s, vxVarStr[i]) == 0) {
-                *t = vxVarMap[i];
-                return 0;
-            }
-    return 1;
+std::optional<orb_variable_type_t> variable_type_named(std::string_view name) {
+    for (size_t i = 0; i < variable_names.size(); ++i)
+        if (language::same_text(variable_names[i], name))
+            return vxVarMap[i];
+    return std::nullopt;
 }
 
-vx_int64_t int_from_text(cdgen &cx, const char *text, char **end, int base) {
+vx_int64_t int_from_text(cdgen &cx, std::string_view text, char **end, int base) {
     vx_uint64_t plain = 0;
-    bool decimal = base == 10 || (base == 0 && (text[0] != '0' || text[1] == '\0'));
-    const char *after = decimal ? plain_decimal(text, &plain) : nullptr;
-    if (after == nullptr)
-        return library_integer(cx, text, end, base);
+    bool decimal = base == 10 || (base == 0 && (text.size() == 1 || !text.starts_with('0')));
+    if (!decimal || !plain_unsigned(text, &plain))
+        return library_integer(cx, text.data(), end, base);
     if (end != nullptr)
-        *end = const_cast<char *>(after);
+        *end = const_cast<char *>(text.data() + text.size());
     return static_cast<vx_int64_t>(plain);
 }
 
-int str_to_vx(cdgen &cx, vx_value_t *vx_out, vx_data_type_t vx_type, const char *str_in, text_pool &pool) {
+int str_to_vx(cdgen &cx, vx_value_t *vx_out, vx_data_type_t vx_type, std::string_view str_in, text_pool &pool) {
     vx_data_type_t scalar = scalar_vx(vx_type);
-    if (str_in[0] == '\0' || scalar < VX_INT32 || scalar > VX_BINARY_PTR)
+    if (str_in.empty() || scalar < VX_INT32 || scalar > VX_BINARY_PTR)
         return -1;
     return converters[scalar - VX_INT32](cx, vx_out, str_in, pool);
 }
@@ -322,8 +310,9 @@ void set_props(vx_uint32_t *dest, const props_t *props, int len, char *vnoq) {
         rest = getNextArrVal(rest);
         if (*name == '\0') /* an empty field */
             continue;
+        size_t length = rest != nullptr ? static_cast<size_t>(rest - 1 - name) : strlen(name);
         const props_t *known = props;
-        while (known < props + len && (known->s[0] != name[0] || strcmp(known->s, name) != 0))
+        while (known < props + len && !is_named(*known, {name, length}))
             ++known;
         if (known == props + len)
             cdgen_error_exit(MSG_INVALID_PROPERTY, name, nullptr, 0, 1);

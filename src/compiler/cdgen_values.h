@@ -7,6 +7,8 @@
 #include "format/names.h"
 
 #include <cstddef>
+#include <optional>
+#include <string_view>
 
 /* What is serialised. */
 enum type_out_mode {
@@ -19,18 +21,18 @@ enum type_out_mode {
     R_HI_DEFAULT = 7  /* a range's upper bound */
 };
 
-/* The code of a type's source name; VX_UNKNOWN for null, unknown names and "UNKNOWN" itself. */
-vx_data_type_t strToVxDt(const char *s);
-/* 0 and the code of a variable type's name, or 1 with *t left alone. */
-int strToVar(const char *s, orb_variable_type_t *t);
+/* The code of a type's source name; VX_UNKNOWN for unknown names and "UNKNOWN" itself. */
+vx_data_type_t data_type_named(std::string_view name);
+/* The code of a variable type's name; nothing for another. */
+std::optional<orb_variable_type_t> variable_type_named(std::string_view name);
 
-/* Integers of 64 bits, on every machine, by the rules of the C library, base 0, 8 or 10. An overflow is remembered in
- * cx.conv_errno. */
-vx_int64_t int_from_text(cdgen &cx, const char *text, char **end, int base);
+/* In what follows, a text ends with a NUL. Integers of 64 bits, on every machine, by the rules of the C library, base
+ * 0, 8 or 10. An overflow is remembered in cx.conv_errno. */
+vx_int64_t int_from_text(cdgen &cx, std::string_view text, char **end, int base);
 
 /* Converts text into *vx_out, for an array type into one element; 0, or -1 if the text is not a value of the type.
  * Texts and binaries are stored in the pool. */
-int str_to_vx(cdgen &cx, vx_value_t *vx_out, vx_data_type_t vx_type, const char *str_in, text_pool &pool);
+int str_to_vx(cdgen &cx, vx_value_t *vx_out, vx_data_type_t vx_type, std::string_view str_in, text_pool &pool);
 /* Decode into a block of a 32-bit length and bytes, for which vx_out must have room: 0, or -1 on malformed text.
  * oct_convert knows two forms of output: 1, text with a NUL at its end; 2, such a block. */
 int hex_convert(char *vx_out, const char *str_in);

@@ -52,6 +52,17 @@ tbl *sc_sd_tbl(cdgen &cx, const srtable_ctrl &kind) {
     return kind.sc_side_tables == TABLES_OF_CMMAP ? nullptr : staged_tbl(cx.staged.cb_rsrc_class.u_rc_sd_defs);
 }
 
+vx_data_type_t strToVxDt(const char *s) {
+    return s == nullptr ? VX_UNKNOWN : data_type_named(s);
+}
+
+int strToVar(const char *s, orb_variable_type_t *t) {
+    std::optional<orb_variable_type_t> known = s == nullptr ? std::nullopt : variable_type_named(s);
+    if (known)
+        *t = *known;
+    return known ? 0 : 1;
+}
+
 void save_attr(cdgen &cx, char *il, int table_id) {
     char *name = il + strspn(il, " \t");
     auto kind = static_cast<size_t>(table_id);

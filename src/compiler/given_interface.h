@@ -29,6 +29,12 @@ sd_type_t SD_stanza_type(int table_id);
 /* The table for the elements of the kind's stanzas; null if it has none. It is laid down, and nothing calls it. */
 tbl *sc_sd_tbl(cdgen &cx, const srtable_ctrl &kind);
 
+/* What data_type_named says of a name; VX_UNKNOWN for null. It is laid down, and nothing calls it. */
+vx_data_type_t strToVxDt(const char *s);
+
+/* 0 and what variable_type_named says of a name, or 1 with *t left alone. It is laid down, and nothing calls it. */
+int strToVar(const char *s, orb_variable_type_t *t);
+
 /* Takes one attribute line, il, without comment and newline, apart in place. It is laid down, and nothing calls it. */
 void save_attr(cdgen &cx, char *il, int table_id);
 

@@ -4,37 +4,11 @@
 #define CDGEN_LANGUAGE_ATTRIBUTE_ORDER_H
 
 #include "language/catalogue.h"
+#include "language/same_bytes.h"
 
 #include <array>
-#include <cstring>
 
 namespace language {
-
-/* Whether both begin with the same word, and end with one, after n bytes. The two words may overlap. */
-template <class Word> bool same_ends(const char *a, const char *b, std::size_t n) {
-    auto differ = [a, b](std::size_t at) {
-        Word left = 0;
-        Word right = 0;
-        std::memcpy(&left, a + at, sizeof left);
-        std::memcpy(&right, b + at, sizeof right);
-        return left ^ right;
-    };
-    return (differ(0) | differ(n - sizeof(Word))) == 0;
-}
-
-/* What memcmp says of n bytes; names are too short for a call. */
-inline bool same_bytes(const char *a, const char *b, std::size_t n) {
-    for (constexpr std::size_t STEP = sizeof(std::uint64_t); n > 2 * STEP; a += STEP, b += STEP, n -= STEP)
-        if (!same_ends<std::uint64_t>(a, b, STEP))
-            return false;
-    if (n >= sizeof(std::uint64_t))
-        return same_ends<std::uint64_t>(a, b, n);
-    if (n >= sizeof(std::uint32_t))
-        return same_ends<std::uint32_t>(a, b, n);
-    if (n >= sizeof(std::uint16_t))
-        return same_ends<std::uint16_t>(a, b, n);
-    return n == 0 || *a == *b;
-}
 
 /* The order in which the stanzas of one kind have given their attributes. */
 class attribute_order {

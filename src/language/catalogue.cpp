@@ -2,15 +2,21 @@
 
 #include "language/catalogue_rows.h"
 #include "language/fields.h"
+#include "language/same_bytes.h"
 
 #include <bit>
-#include <cstring>
 
 namespace {
 
 using language::rows::catalogue;
 
-constexpr name_index stanza_names(SC_COUNT, [](std::size_t i) { return std::string_view(catalogue[i].sc_name); });
+constexpr auto stanza_names = [] {
+    std::array<std::string_view, SC_COUNT> names;
+    for (std::size_t i = 0; i < names.size(); ++i)
+        names[i] = catalogue[i].sc_name;
+    return names;
+}();
+constexpr name_index stanza_index(SC_COUNT, [](std::size_t i) { return stanza_names[i]; });
 
 /* The stanzas that the assembly reaches by index instead of by name. */
 constexpr bool named(stanza_id id, std::string_view name) {
@@ -66,9 +72,9 @@ static_assert(each_stanza([](const srtable_ctrl &stanza) {
 
 constinit const std::array<srtable_ctrl, SC_COUNT + 1> sc_tables = catalogue;
 
-int set_table_id(const char *name) {
-    int id = stanza_names.candidate(name);
-    return id >= 0 && std::strcmp(sc_tables[static_cast<std::size_t>(id)].sc_name, name) == 0 ? id : -1;
+int set_table_id(std::string_view name) {
+    int id = stanza_index.candidate(name);
+    return id >= 0 && language::same_text(stanza_names[static_cast<std::size_t>(id)], name) ? id : -1;
 }
 
 const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name) {
@@ -76,6 +82,5 @@ const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name) {
     if (at < 0)
         return nullptr;
     const table_attrs &attr = scp.sc_attrs[static_cast<std::size_t>(at)];
-    return name.size() == attr.ta_length && std::memcmp(name.data(), attr.ta_name, attr.ta_length) == 0 ? &attr
-                                                                                                        : nullptr;
+    return language::same_text({attr.ta_name, attr.ta_length}, name) ? &attr : nullptr;
 }

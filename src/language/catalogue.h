@@ -152,7 +152,7 @@ struct srtable_ctrl {
 extern const std::array<srtable_ctrl, SC_COUNT + 1> sc_tables;
 
 /* The index of a stanza kind by its exact name, or -1. */
-int set_table_id(const char *name);
+int set_table_id(std::string_view name);
 /* A kind's attribute by its exact name, or null. */
 const table_attrs *find_attr(const srtable_ctrl &scp, std::string_view name);
 

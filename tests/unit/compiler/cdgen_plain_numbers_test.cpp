@@ -4,9 +4,14 @@
 
 #include <gtest/gtest.h>
 
+#include <cerrno>
+#include <cmath>
+#include <cstdio>
 #include <cstdlib>
+#include <limits>
 #include <random>
 #include <string>
+#include <tuple>
 
 namespace {
 
@@ -64,6 +69,98 @@ TEST(PlainFraction, HasTheLibrarysBitsAnywhere) {
         std::string text = std::to_string(random() >> (random() % 64));
         text.insert(text.size() - random() % (text.size() < 9 ? text.size() : 9), ".");
         expect_library_bits((random() % 2 != 0 ? "-" : "") + (text[0] == '.' ? "0" + text : text));
+    }
+}
+
+/* ---- Any text -------------------------------------------------------------------------------------------------- */
+
+/* The result of a conversion, the bits of its value if it is 0, and errno as it leaves it. */
+using outcome = std::tuple<int, std::string, int>;
+
+template <class Float> outcome by_the_library(const std::string &text, Float (*convert)(const char *, char **)) {
+    using limits = std::numeric_limits<Float>;
+    char *end = nullptr;
+    errno = 0;
+    Float value = convert(text.c_str(), &end);
+    bool suspicious = value == 0 || value >= limits::max() || value == limits::min();
+    bool refused = text.empty() || *end != '\0' || (suspicious && (errno == ERANGE || errno == EINVAL));
+    return {refused ? -1 : 0, refused ? "" : bits(value), text.empty() ? 0 : errno};
+}
+
+template <class Float> outcome by_the_compiler(const std::string &text, vx_data_type_t type) {
+    static cdgen cx;
+    text_pool pool;
+    vx_value_t cell = {};
+    cx.conv_errno = 0;
+    int result = str_to_vx(cx, &cell, type, text, pool);
+    Float value = 0;
+    memcpy(&value, &cell, sizeof value);
+    return {result, result == 0 ? bits(value) : "", cx.conv_errno};
+}
+
+std::string digits(std::mt19937_64 &random, size_t most) {
+    std::string text;
+    for (size_t count = random() % (most + 1); count > 0; --count)
+        text += static_cast<char>('0' + random() % 10);
+    return text;
+}
+
+std::string written(const char *form, double number) {
+    char text[2000];
+    snprintf(text, sizeof text, form, number);
+    return text;
+}
+
+/* A number of which a Float, the one after it, or the middle between them is the nearest: all its digits, or a few. */
+template <class Float> std::string close_to(std::mt19937_64 &random) {
+    std::conditional_t<sizeof(Float) == 4, uint32_t, uint64_t> pattern = 0;
+    pattern = static_cast<decltype(pattern)>(random());
+    if (random() % 8 == 0)
+        pattern %= decltype(pattern){1} << (random() % (8 * sizeof pattern)); /* small ones lose precision */
+    Float number = 0;
+    memcpy(&number, &pattern, sizeof number);
+    Float next = std::nextafter(number, std::numeric_limits<Float>::infinity());
+    double middle = sizeof(Float) == 4 ? (double{number} + double{next}) / 2 : number;
+    constexpr const char *FORMS[] = {"%.7g", "%.9g", "%.17g", "%.30e", "%.1080g", "%a"};
+    return written(FORMS[random() % std::size(FORMS)], random() % 2 == 0 ? double{number} : middle);
+}
+
+std::string any_number(std::mt19937_64 &random) {
+    switch (random() % 4) {
+    case 0:
+        return close_to<float>(random);
+    case 1:
+        return close_to<double>(random);
+    default:
+        break;
+    }
+    std::string text = (random() % 4 == 0 ? "-" : "") + digits(random, random() % 30);
+    if (random() % 2 == 0)
+        text += "." + digits(random, random() % 30);
+    constexpr const char *EXPONENTS[] = {"", "", "e", "E-", "e+", "p", "x"};
+    const char *exponent = EXPONENTS[random() % std::size(EXPONENTS)];
+    return *exponent == '\0' ? text : text + exponent + digits(random, 3);
+}
+
+std::string any_text(std::mt19937_64 &random) {
+    constexpr const char *WORDS[] = {"inf", "-inf", "nan", "NAN(1)", "infinity", "", "-", ".", "0x", "0x1p", "1e999"};
+    if (random() % 50 == 0)
+        return WORDS[random() % std::size(WORDS)];
+    std::string text = any_number(random);
+    if (random() % 20 == 0)
+        text.insert(random() % (text.size() + 1), 1, "+- .e0x,\t1"[random() % 10]);
+    return text;
+}
+
+/* script/proof asks for millions. */
+TEST(PlainFraction, AnyTextHasTheLibrarysOutcome) {
+    const char *wanted = getenv("CDGEN_FLOATS");
+    const char *seed = getenv("CDGEN_FLOATS_SEED");
+    std::mt19937_64 random(seed == nullptr ? 1 : strtoull(seed, nullptr, 10));
+    for (unsigned long left = wanted == nullptr ? 30000 : strtoul(wanted, nullptr, 10); left > 0; --left) {
+        std::string text = any_text(random);
+        ASSERT_EQ(by_the_compiler<float>(text, VX_FLOAT32), by_the_library(text, strtof)) << text;
+        ASSERT_EQ(by_the_compiler<double>(text, VX_FLOAT64), by_the_library(text, strtod)) << text;
     }
 }
 

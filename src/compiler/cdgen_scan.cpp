@@ -118,4 +118,7 @@ block_bits scan_block(const char *bytes) {
         uint64_t &last = places->words[size / SCAN_BLOCK];
         last = (last & (end - 1)) | end;
     }
+    block = 0;
+    rest = newlines.words[0];
+    take_newline();
 }

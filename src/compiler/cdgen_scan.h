@@ -51,8 +51,24 @@ struct scanned_places {
     /* The buffer has at most SCAN_BUFFER bytes, and SCAN_BLOCK more that may be read. */
     void scan(const char *buffer, size_t size);
 
-    place_set newlines;
+    /* The first newline that has not been taken, or the end of the buffer, which cannot be taken. */
+    size_t newline() const {
+        return next_newline;
+    }
+    void take_newline() {
+        while (rest == 0)
+            rest = newlines.words[++block];
+        next_newline = block * SCAN_BLOCK + static_cast<size_t>(std::countr_zero(rest));
+        rest &= rest - 1;
+    }
+
     place_set marks;
+
+private:
+    place_set newlines;
+    size_t next_newline = 0;
+    size_t block = 0;  /* the one that next_newline is in, and */
+    uint64_t rest = 0; /* the newlines after it there */
 };
 
 #endif

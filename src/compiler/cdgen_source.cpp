@@ -54,6 +54,7 @@ source_line whole_line(source_file &source, size_t length) {
     if (source.mark < place)
         source.mark = source.places.marks.first_from(place);
     source.pos += length + 1;
+    source.places.take_newline();
     return {begin,
             begin + length,
             source.buffer.data() + source.end,
@@ -77,7 +78,7 @@ source_line cut_line(cdgen &cx, size_t length) {
 source_line some_line(cdgen &cx) {
     source_file &source = cx.source.cdb_fp;
     for (;;) {
-        size_t newline = source.places.newlines.first_from(source.pos);
+        size_t newline = source.places.newline();
         size_t length = newline - source.pos;
         if (length < LINE_MAX_CHARS && newline < source.end)
             return whole_line(source, length);
@@ -97,7 +98,7 @@ char *next_mark(const source_line &line, const char *p) {
 }
 
 bool is_blank(char c) {
-    return c == ' ' || c == '\t';
+    return static_cast<unsigned char>(c) <= ' ' && (c == ' ' || c == '\t');
 }
 
 /* Where the text of a line that has marks ends: at its newline, its comment, or its NUL. Null for a line without text:

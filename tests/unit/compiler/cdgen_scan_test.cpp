@@ -54,9 +54,14 @@ void expect_places_of(const std::string &padded, size_t size) {
     auto places = std::make_unique<scanned_places>();
     places->scan(padded.data(), size);
     std::string_view bytes(padded.data(), size);
-    for (size_t from = 0; from <= size; ++from) {
-        ASSERT_EQ(places->newlines.first_from(from), first_in(bytes, from, [](char c) { return c == '\n'; }));
+    for (size_t from = 0; from <= size; ++from)
         ASSERT_EQ(places->marks.first_from(from), first_in(bytes, from, is_mark));
+    for (size_t from = 0; from <= size; from = places->newline() + 1) {
+        if (from > 0)
+            places->take_newline();
+        ASSERT_EQ(places->newline(), first_in(bytes, from, [](char c) { return c == '\n'; }));
+        if (places->newline() == size)
+            return;
     }
 }
 
@@ -95,7 +100,7 @@ TEST(Scan, FullBuffer) {
 
 TEST(Scan, EmptyFromTheStart) {
     auto places = std::make_unique<scanned_places>();
-    EXPECT_EQ(places->newlines.first_from(0), 0U);
+    EXPECT_EQ(places->newline(), 0U);
     EXPECT_EQ(places->marks.first_from(0), 0U);
 }
 

@@ -180,6 +180,8 @@ vx_value_t converted(const attr_line &line, vx_data_type_t type, std::string_vie
 
 /* Serialises a value into a cell, with an array of its own if it is one. */
 void copied(const attr_line &line, vx_value_t *cell, const vx_value_t &value, vx_data_type_t type, message_id failure) {
+    if (copy_number(*cell, value, type)) /* most are */
+        return;
     tbl_anchor array;
     if (copy_this_type(line.cx, cell, &value, type, TYPE_SAME, strings_of(line), &array, 1) != 0)
         source_error(line.cx, failure);
@@ -241,7 +243,7 @@ bool is_sd(vx_data_type_t type) {
 std::shared_ptr<dflt_values> new_dflt_values(cdgen &cx, const char *name, vx_data_type_t sd_type = VX_UNKNOWN) {
     if (cx.framing.spare_dflt == nullptr)
         return std::make_shared<dflt_values>(name, sd_type);
-    cx.framing.spare_dflt->restart(name, sd_type);
+    cx.framing.spare_dflt->restart(name, sd_type, cx.options.debugLevel > 2);
     return std::move(cx.framing.spare_dflt);
 }
 

@@ -15,9 +15,12 @@
 
 namespace {
 
-size_t used_bytes(const cdb_ref_t &table) {
-    const tbl_content *t = staged_content(table);
+size_t used_bytes(const tbl_content *t) {
     return t == nullptr || t->tbl_base == nullptr ? 0 : t->used();
+}
+
+size_t used_bytes(const cdb_ref_t &table) {
+    return used_bytes(staged_content(table));
 }
 
 /* ---- Sizes ----------------------------------------------------------------------------------------------------- */
@@ -87,18 +90,30 @@ public:
         return at;
     }
 
-    /* A staged table's bytes. */
-    void write_table(const cdb_ref_t &table) {
-        if (size_t size = used_bytes(table))
-            write(staged_content(table)->tbl_base, size);
+    /* A staged table's bytes, which the table gives back meanwhile: otherwise all would be there twice at the end. */
+    size_t move_table(tbl_content *t) {
+        size_t size = used_bytes(t);
+        if (size == 0)
+            return 0;
+        if (t->tbl_owner == memory_owner::RESERVED)
+            for (; t->used() > RESERVE_FROM; t->release_front(RESERVE_FROM))
+                write(t->tbl_base, RESERVE_FROM);
+        write(t->tbl_base, t->used());
+        t->release();
+        return size;
     }
 
-    /* The same, zero-filled to a multiple of 8; returns its rounded size. */
-    vx_uint32_t write_rounded(const tbl_content *t) {
-        size_t size = t == nullptr || t->tbl_base == nullptr ? 0 : t->used();
-        write(size > 0 ? t->tbl_base : nullptr, size);
+    /* Zeros up to a multiple of 8, after so many bytes. */
+    void round_up(size_t size) {
         constexpr char zeros[8] = {};
         write(zeros, round8(size) - size);
+    }
+
+    /* A staged table's bytes, zero-filled to a multiple of 8; returns their rounded size. */
+    vx_uint32_t write_rounded(const tbl_content *t) {
+        size_t size = used_bytes(t);
+        write(size > 0 ? t->tbl_base : nullptr, size);
+        round_up(size);
         return static_cast<vx_uint32_t>(round8(size));
     }
 
@@ -143,10 +158,9 @@ void add_class(cdgen &cx, const rsrc_class_t &staged) {
     for (const cdb::side_table &table : cdb::side_tables) {
         auto offset = static_cast<vx_uint32_t>(cx.image.dsp - at);
         record.*table.ref = {{table.form == cdb::table_form::UNLOCATED ? 0 : offset, 0}};
+        size_t size = out.move_table(staged_content(staged.*table.ref));
         if (table.form == cdb::table_form::ROUNDED)
-            out.write_rounded(staged_content(staged.*table.ref));
-        else
-            out.write_table(staged.*table.ref);
+            out.round_up(size);
     }
     store(at, record);
     note_nowhere(cx, record, at);

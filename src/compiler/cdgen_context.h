@@ -50,4 +50,13 @@ struct cdgen {
     output_file output;
 };
 
+/* Reaching the end exactly grows the table too. Without a block there is no room. */
+inline void *alloc_tble(cdgen &cx, tbl *t, size_t s) {
+    if (s >= t->room() || cx.options.debugLevel > 2)
+        make_room(cx, *t, s);
+    char *reserved = t->tbl_next;
+    t->tbl_next += s;
+    return reserved;
+}
+
 #endif

@@ -14,8 +14,11 @@ struct dflt_values {
     dflt_values(const char *name, vx_data_type_t type = VX_UNKNOWN) : cells(32, name), sd_type(type) {}
 
     /* Empty, as if new, except that memory is reused. */
-    void restart(const char *name, vx_data_type_t type = VX_UNKNOWN) {
-        cells.restart(name);
+    void restart(const char *name, vx_data_type_t type = VX_UNKNOWN, bool traced = true) {
+        if (traced)
+            cells.restart(name);
+        else
+            cells.restart_untraced(name);
         texts.clear();
         sd_type = type;
     }

@@ -39,7 +39,8 @@ struct image_cursor {
 /* The image. cdb_size also stores counts and sizes into the staged class records; fit_image counts the sections first,
  * and so finds all that can be wrong with an image before there is a file. */
 void bld_cdb(cdgen &cx);
-/* The same without a file, and always in the machine's own byte order. */
+/* The same without a file, and always in the machine's own byte order. Both give back the tables of classes that they
+ * have written. */
 std::vector<std::byte> image_in_memory(cdgen &cx);
 size_t fit_image(cdgen &cx);
 size_t cdb_size(cdgen &cx);

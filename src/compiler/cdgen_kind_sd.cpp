@@ -105,6 +105,8 @@ void dump_dflt(cdgen &cx, tbl *str_tbl, const dflt_tbl *vtbl, vx_value_t *lval, 
             continue;
         }
         const auto *value = record_at<vx_value_t>(&vtbl->tbl->cells, i * sizeof(vx_value_t));
+        if (copy_number(*lval, *value, dt))
+            continue;
         auto count = static_cast<vx_uint32_t>(vtbl->num_elems);
         if (copy_this_type(cx, lval, value, dt, TYPE_SAME, str_tbl, &anchors.array, count) != 0)
             source_error(cx, MSG_DEFAULT_NOT_COPIED);

@@ -2,6 +2,8 @@
 #ifndef CDGEN_CDGEN_TABLES_H
 #define CDGEN_CDGEN_TABLES_H
 
+#include "compiler/cdgen_memory.h"
+
 #include "cdb.h"
 
 #include <cstddef>
@@ -21,22 +23,32 @@ struct tbl_content {
         return static_cast<size_t>(tbl_next - tbl_base);
     }
 
+    /* Gives the block back, if it is one of its own. */
+    void release();
+    /* Gives back the first bytes of a block that is reserved, a multiple of RESERVE_FROM and less than it holds. */
+    void release_front(size_t bytes);
+
     char *tbl_base = nullptr;       /* null until the first reservation */
     char *tbl_next = nullptr;       /* first unreserved byte */
     const char *tbl_name = nullptr; /* for traces and messages */
+    memory_owner tbl_owner = memory_owner::HEAP;
+    size_t tbl_capacity = 0; /* bytes really held */
 };
 
 /* An append-only arena of zero-filled bytes. It grows by whole allocation units, and so does tbl_size, which the traces
- * show; memory is allocated in larger steps. The block moves when it grows, so references into a table are offsets from
- * tbl_base. Once there is a block, tbl_next < tbl_end and all bytes between them are 0. */
+ * show; memory is allocated in larger steps, and a large table gets address space for all that it may ever hold. The
+ * block moves when it grows beyond what it has, so references into a table are offsets from tbl_base. Once there is a
+ * block, tbl_next < tbl_end and all bytes between them are 0. */
 struct tbl : tbl_content {
-    tbl(size_t au, const char *name) : tbl_content{nullptr, nullptr, name}, tbl_au(au) {}
+    tbl(size_t au, const char *name) : tbl_content{.tbl_name = name}, tbl_au(au) {}
     tbl(const tbl &) = delete;
     tbl &operator=(const tbl &) = delete;
     ~tbl();
 
     /* Empty, as if it were new; the block waits for the first reservation. */
     void restart(const char *name);
+    /* Empty, as after a first reservation of no bytes; what a trace would say of that is not said. */
+    void restart_untraced(const char *name);
 
     size_t room() const {
         return static_cast<size_t>(tbl_end - tbl_next);
@@ -46,7 +58,6 @@ struct tbl : tbl_content {
     size_t tbl_size = 0;           /* bytes, a multiple of tbl_au */
     char *tbl_end = nullptr;       /* tbl_base + tbl_size */
     size_t tbl_au;                 /* bytes: the first block and the granule of every growth */
-    size_t tbl_capacity = 0;       /* bytes really held, at least tbl_size */
     char *tbl_spare = nullptr;     /* the block before the first reservation, if there is one already */
 };
 
@@ -64,7 +75,10 @@ void *cfg_malloc(size_t s);
 tbl *make_tbl(cdgen &cx, size_t au, const char *name);
 
 /* Reserves s bytes, zeroed, at the end of t. The address holds until the next reservation in t. */
-void *alloc_tble(cdgen &cx, tbl *t, size_t s);
+inline void *alloc_tble(cdgen &cx, tbl *t, size_t s); /* cdgen_context.h has its body */
+
+/* Its rarer part: traces the reservation, and makes s more bytes fit in front of the end of t. */
+void make_room(cdgen &cx, tbl &t, size_t s);
 
 /* Gives back what a table does not use, down to tbl_next. */
 void trim_tbl(tbl *t);

@@ -2,25 +2,9 @@
 
 #include "compiler/cdgen_values.h"
 
-#include "compiler/cdgen_error.h"
+#include "compiler/cdgen_context.h"
 
 namespace {
-
-/* The bytes of the cell that a number of a type takes; 0 for no number. */
-size_t number_width(vx_data_type_t type) {
-    switch (type) {
-    case VX_INT32:
-    case VX_UINT32:
-    case VX_FLOAT32:
-        return 4;
-    case VX_INT64:
-    case VX_UINT64:
-    case VX_FLOAT64:
-        return 8;
-    default:
-        return 0;
-    }
-}
 
 /* 100, the default upper bound, as a number of a type. */
 vx_value_t hundred(vx_data_type_t type) {
@@ -57,28 +41,20 @@ int encode_16(vx_value_t &cell, const encoding &e) {
     return 0;
 }
 
-void copy_number(vx_value_t &cell, const vx_value_t &number, size_t width) {
-    if (width == 4)
-        memcpy(&cell, &number, 4);
-    else if (width == 8)
-        memcpy(&cell, &number, 8);
-}
-
 int encode_number(vx_value_t &cell, const encoding &e) {
-    size_t width = number_width(e.type);
     vx_value_t zero = {};
     zero.val_uint64 = 0;
     switch (e.mode) {
     case TYPE_SAME:
-        copy_number(cell, *e.in, width);
+        copy_number(cell, *e.in, e.type);
         return 0;
     case TYPE_16:
         return encode_16(cell, e);
     case R_HI_DEFAULT:
-        copy_number(cell, hundred(e.type), width);
+        copy_number(cell, hundred(e.type), e.type);
         return 0;
     default:
-        copy_number(cell, zero, width);
+        copy_number(cell, zero, e.type);
         return 0;
     }
 }
@@ -223,10 +199,8 @@ vx_uint32_t init_array_sd(cdgen &cx, tbl *str_tbl, tbl_anchor *array_anchor, tbl
 
 int copy_this_type(cdgen &cx, vx_value_t *out_data, const vx_value_t *in_data, vx_data_type_t type_in, int type_out,
                    tbl *str_tbl, tbl_anchor *array_anchor, vx_uint32_t array_cnt) {
-    if (size_t width = number_width(type_in); width > 0 && type_out == TYPE_SAME && in_data != nullptr) {
-        copy_number(*out_data, *in_data, width); /* most values are plain numbers */
+    if (type_out == TYPE_SAME && in_data != nullptr && copy_number(*out_data, *in_data, type_in))
         return 0;
-    }
     refuse(type_in);
     if (type_in <= VX_UNKNOWN || type_in > VX_SD_PTR_ARRAY)
         return -1;

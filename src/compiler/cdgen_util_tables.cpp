@@ -13,21 +13,51 @@
 #include <new>
 #include <utility>
 
+void tbl_content::release() {
+    if (tbl_owner == memory_owner::POOL)
+        return;
+    if (tbl_owner == memory_owner::RESERVED)
+        give_back(tbl_base, tbl_capacity);
+    else
+        free(tbl_base);
+    tbl_base = tbl_next = nullptr;
+    tbl_owner = memory_owner::HEAP;
+    tbl_capacity = 0;
+}
+
+void tbl_content::release_front(size_t bytes) {
+    give_back(tbl_base, bytes);
+    tbl_base += bytes;
+    tbl_capacity -= bytes;
+}
+
 tbl::~tbl() {
-    free(tbl_base);
+    release();
     free(tbl_spare);
 }
 
 table_store::~table_store() {
     for (tbl_content &content : filed)
-        free(content.tbl_base);
+        content.release();
 }
 
 void tbl::restart(const char *name) {
+    if (tbl_owner == memory_owner::RESERVED)
+        release();
     if (tbl_base != nullptr)
         tbl_spare = tbl_base;
     tbl_base = tbl_prev_base = tbl_next = tbl_end = nullptr;
     tbl_size = 0;
+    tbl_name = name;
+}
+
+void tbl::restart_untraced(const char *name) {
+    if (tbl_base == nullptr || tbl_owner == memory_owner::RESERVED)
+        return restart(name);
+    memset(tbl_base, 0, std::min(used(), tbl_au));
+    tbl_next = tbl_prev_base = tbl_base;
+    tbl_size = tbl_au;
+    tbl_end = tbl_base + tbl_size;
     tbl_name = name;
 }
 
@@ -59,17 +89,41 @@ size_t growth_chunk(const tbl &t, size_t s) {
     return chunk >= s ? chunk : (s + t.tbl_au - 1) / t.tbl_au * t.tbl_au;
 }
 
-/* Memory for the table's first or next bytes. Half as much again is asked for, so that a large table does not move at
- * every unit; if there is not that much memory, just what is needed. */
-char *larger_block(tbl &t, size_t needed) {
+/* Takes a block for the table's first or next bytes from the heap. Half as much again is asked for, so that a table
+ * does not move at every unit; if there is not that much memory, just what is needed. */
+bool take_from_heap(tbl &t, size_t needed) {
     size_t generous = std::max(needed, t.tbl_capacity + t.tbl_capacity / 2);
     for (size_t capacity : {generous, needed}) {
-        if (char *block = static_cast<char *>(realloc(t.tbl_base, capacity))) {
+        if (auto *block = static_cast<char *>(realloc(t.tbl_base, capacity))) {
             t.tbl_capacity = capacity;
-            return block;
+            t.tbl_base = block;
+            return true;
         }
     }
-    return nullptr;
+    return false;
+}
+
+/* Moves the table to reserved address space, if there is some. */
+bool take_reserved(tbl &t, size_t needed) {
+    size_t capacity = 0;
+    char *block = reserve(needed, &capacity);
+    if (block == nullptr)
+        return false;
+    size_t used = t.used();
+    if (used > 0)
+        memcpy(block, t.tbl_base, used);
+    t.release();
+    t.tbl_base = block;
+    t.tbl_owner = memory_owner::RESERVED;
+    t.tbl_capacity = capacity;
+    return true;
+}
+
+/* A block that is large enough, with what the table holds; false if there is no memory. */
+bool take_block(tbl &t, size_t needed) {
+    if (needed >= RESERVE_FROM && take_reserved(t, needed))
+        return true;
+    return t.tbl_owner == memory_owner::HEAP && take_from_heap(t, needed);
 }
 
 [[noreturn]] void table_failure(const tbl &t, message_id what) {
@@ -78,13 +132,14 @@ char *larger_block(tbl &t, size_t needed) {
 }
 
 void first_block(cdgen &cx, tbl &t) {
-    char *block = t.tbl_spare != nullptr ? std::exchange(t.tbl_spare, nullptr) : larger_block(t, t.tbl_au);
-    if (block == nullptr)
+    t.tbl_base = std::exchange(t.tbl_spare, nullptr);
+    if (t.tbl_base == nullptr && !take_block(t, t.tbl_au))
         table_failure(t, MSG_NO_MEMORY_FOR_TABLE);
-    memset(block, 0, t.tbl_au);
-    t.tbl_base = t.tbl_prev_base = t.tbl_next = block;
+    if (t.tbl_owner == memory_owner::HEAP)
+        memset(t.tbl_base, 0, t.tbl_au);
+    t.tbl_prev_base = t.tbl_next = t.tbl_base;
     t.tbl_size = t.tbl_au;
-    t.tbl_end = block + t.tbl_size;
+    t.tbl_end = t.tbl_base + t.tbl_size;
     if (cx.options.debugLevel > 2)
         printf("alloc_tble: %s, table size: %d\n", t.tbl_name, static_cast<int>(t.tbl_size));
 }
@@ -97,19 +152,18 @@ void grow(cdgen &cx, tbl &t, size_t s) {
                 static_cast<int>(chunk), t.tbl_name);
     t.tbl_prev_base = t.tbl_base;
     size_t size = t.tbl_size + chunk;
-    if (size > t.tbl_capacity) {
-        char *block = larger_block(t, size);
-        if (block == nullptr)
-            table_failure(t, MSG_NO_MEMORY_TO_GROW);
-        t.tbl_base = block;
-        t.tbl_next = block + used;
-    }
+    if (size > t.tbl_capacity && !take_block(t, size))
+        table_failure(t, MSG_NO_MEMORY_TO_GROW);
+    t.tbl_next = t.tbl_base + used;
+    if (t.tbl_owner == memory_owner::HEAP)
+        memset(t.tbl_base + t.tbl_size, 0, chunk);
     t.tbl_size = size;
     t.tbl_end = t.tbl_base + size;
-    memset(t.tbl_next, 0, size - used);
     if (cx.options.debugLevel > 2)
         printf("alloc_tble: %s, new table size: %d\n", t.tbl_name, static_cast<int>(t.tbl_size));
 }
+
+} // namespace
 
 [[gnu::noinline]] void make_room(cdgen &cx, tbl &t, size_t s) {
     if (cx.options.debugLevel > 2)
@@ -120,27 +174,20 @@ void grow(cdgen &cx, tbl &t, size_t s) {
         grow(cx, t, s);
 }
 
-} // namespace
-
-void *alloc_tble(cdgen &cx, tbl *t, size_t s) {
-    if (s >= t->room() ||
-        cx.options.debugLevel > 2) /* reaching the end exactly grows too; without a block there is no room */
-        make_room(cx, *t, s);
-    char *reserved = t->tbl_next;
-    t->tbl_next += s;
-    return reserved;
-}
-
 void trim_tbl(tbl *t) {
     size_t used = t == nullptr ? 0 : t->used();
     if (used == 0)
         return;
-    char *block = static_cast<char *>(realloc(t->tbl_base, used));
-    if (block == nullptr)
+    if (t->tbl_owner == memory_owner::RESERVED) {
+        t->tbl_capacity = give_back(t->tbl_base, t->tbl_capacity, used);
+    } else if (auto *block = static_cast<char *>(realloc(t->tbl_base, used))) {
+        t->tbl_base = block;
+        t->tbl_capacity = used;
+    } else {
         return;
-    t->tbl_base = block;
-    t->tbl_next = t->tbl_end = block + used;
-    t->tbl_size = t->tbl_capacity = used;
+    }
+    t->tbl_next = t->tbl_end = t->tbl_base + used;
+    t->tbl_size = used;
 }
 
 vx_uint32_t save_tbl_val_round(cdgen &cx, tbl *tp, const void *val, size_t len) {
@@ -214,13 +261,13 @@ tbl_content *keep_copy(cdgen &cx, const tbl &t) {
         table_failure(t, MSG_NO_MEMORY_FOR_TABLE);
     char *bytes = content + sizeof(tbl_content);
     memcpy(bytes, t.tbl_base, t.used());
-    return new (content) tbl_content{bytes, bytes + t.used(), t.tbl_name};
+    return new (content) tbl_content{bytes, bytes + t.used(), t.tbl_name, memory_owner::POOL};
 }
 
 tbl_content *keep_block(cdgen &cx, tbl &t) {
     trim_tbl(&t);
     tbl_content *kept = &cx.store.filed.emplace_back(t);
-    t.tbl_base = t.tbl_next = nullptr;
+    static_cast<tbl_content &>(t) = {.tbl_name = t.tbl_name};
     return kept;
 }
 

@@ -10,6 +10,7 @@
 #include <algorithm>
 #include <array>
 #include <cerrno>
+#include <cfloat>
 #include <charconv>
 #include <cmath>
 #include <cstdlib>
@@ -57,9 +58,37 @@ bool plain_signed(std::string_view text, vx_int64_t *value) {
     return plain;
 }
 
+/* Digits with or without a fraction, such that they as an integer and the power of ten are exact: the one division
+ * rounds as the C library does. */
+template <class Float> bool exact_fraction(std::string_view text, Float *value) {
+    constexpr vx_uint64_t EXACT = vx_uint64_t{1} << std::numeric_limits<Float>::digits;
+    constexpr size_t EXACT_POWER = sizeof(Float) == sizeof(float) ? 10 : 18; /* of ten; and no overflow of n */
+    bool negative = text.starts_with('-');
+    vx_uint64_t n = 0;
+    Float scale = 1;
+    Float step = 1;
+    for (char c : text.substr(negative)) {
+        unsigned digit = static_cast<unsigned char>(c) - unsigned{'0'};
+        if (digit <= 9) {
+            n = n * 10 + digit;
+            scale *= step;
+        } else if (c == '.' && step == 1) {
+            step = 10;
+        } else {
+            return false;
+        }
+    }
+    Float size = static_cast<Float>(n) / scale;
+    *value = negative ? -size : size;
+    bool rounded_once = FLT_EVAL_METHOD == 0 || FLT_EVAL_METHOD == 1;
+    return rounded_once && n - 1 < EXACT && text.size() <= EXACT_POWER;
+}
+
 /* A decimal number that is normal, and so rounded as the C library rounds it. False where its rules are wanted: for
  * white space, plus signs, hexadecimal numbers, and what it reports in errno. */
 template <class Float> bool plain_float(std::string_view text, Float *value) {
+    if (exact_fraction(text, value))
+        return true;
     const char *end = text.data() + text.size();
     auto [rest, error] = std::from_chars(text.data(), end, *value);
     return rest == end && error == std::errc() && std::isnormal(*value) &&
@@ -236,8 +265,8 @@ std::optional<orb_variable_type_t> variable_type_named(std::string_view name) {
 
 vx_int64_t int_from_text(cdgen &cx, std::string_view text, char **end, int base) {
     vx_uint64_t plain = 0;
-    bool decimal = base == 10 || (base == 0 && (text.size() == 1 || !text.starts_with('0')));
-    if (!decimal || !plain_unsigned(text, &plain))
+    bool digits = plain_unsigned(text, &plain);
+    if (!digits || base == 8 || (base == 0 && text[0] == '0' && text.size() > 1)) /* or not decimal ones */
         return library_integer(cx, text.data(), end, base);
     if (end != nullptr)
         *end = const_cast<char *>(text.data() + text.size());

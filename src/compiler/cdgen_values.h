@@ -6,7 +6,9 @@
 #include "format/data_types.h"
 #include "format/names.h"
 
+#include <array>
 #include <cstddef>
+#include <cstring>
 #include <optional>
 #include <string_view>
 
@@ -47,6 +49,22 @@ void set_props(vx_uint32_t *dest, const props_t *props, int len, char *vnoq);
 int ver_str_convert(cdgen &cx, const char *ver_str, vx_uint32_t *n);
 /* Ends the text at its first comma and returns what follows; null without a comma. */
 char *getNextArrVal(char *line);
+
+/* The bytes of its cell that a number of a type takes; 0 for what is no number. */
+constexpr size_t number_width(vx_data_type_t type) {
+    constexpr std::array<unsigned char, VX_FLOAT64 + 1> widths = {0, 0, 4, 4, 8, 8, 4, 8};
+    return static_cast<size_t>(type) < widths.size() ? widths[type] : 0;
+}
+
+/* Copies a number into its cell; false, and nothing is done, for another type. */
+inline bool copy_number(vx_value_t &cell, const vx_value_t &number, vx_data_type_t type) {
+    size_t width = number_width(type);
+    if (width == 8)
+        memcpy(&cell, &number, 8);
+    else if (width == 4)
+        memcpy(&cell, &number, 4);
+    return width > 0;
+}
 
 /* Write a value, or with no in_data the default that the mode asks for, into a record's cell and, out of line, into the
  * string table. Arrays are filled one element a call, with a capacity of array_cnt. 0, or -1 for a type and mode that

@@ -35,7 +35,7 @@ template <class Word> bool same_ends(const char *a, const char *b, std::size_t n
     return n == 0 || *a == *b;
 }
 
-inline bool same_text(std::string_view a, std::string_view b) {
+[[gnu::always_inline]] inline bool same_text(std::string_view a, std::string_view b) {
     return a.size() == b.size() && same_bytes(a.data(), b.data(), a.size());
 }
 

@@ -2,12 +2,16 @@
 
 #include "check/check.h"
 
+#include "check/edits.h"
 #include "check/recovery.h"
 
+#include <algorithm>
 #include <fcntl.h>
 #include <memory>
+#include <optional>
 #include <unistd.h>
 #include <utility>
+#include <vector>
 
 namespace check {
 
@@ -21,20 +25,24 @@ struct source_check {
     totals run();
     void take(const source_line &source);
     void hand_over(finding &&each);
+    bool is_open(warning_id id, int at_line) const;
 
     compilation compiler;
     current_line line;
     knowledge known;
     const sink &to;
     findings found{[this](finding &&each) { hand_over(std::move(each)); },
-                   [this](warning_id id, int at_line) { return recover.may_retract(id, at_line); }};
+                   [this](warning_id id, int at_line) { return is_open(id, at_line); }};
     const view see = {compiler, line, known, found};
     watchers warned;
+    std::vector<edit> returns; /* what removes carriage returns at the ends of lines */
     recovery recover = {compiler, line, known, found, see, warned};
 };
 
 void source_check::take(const source_line &source) {
     line.read(source, compiler.line_number());
+    if (std::optional<edit> removal = line.without_returns())
+        returns.push_back(std::move(*removal));
     warned.line(see);
     source_line stripped = source;
     if (recover.strips_returns() && line.raw.ends_with('\r'))
@@ -48,11 +56,26 @@ void source_check::take(const source_line &source) {
         recover.take_attribute();
 }
 
+bool removes_returns(const edit &each) {
+    return each.text.empty() && each.removed.starts_with('\r');
+}
+
+/* With its places in the file. The first finding about a carriage return removes those of all lines, as far as the
+ * source has been read. */
 void source_check::hand_over(finding &&each) {
     line.find_in_file(each.at);
     for (note &more : each.notes)
         line.find_in_file(more.at);
+    bool about_returns = std::string_view(each.code) == warnings[CARRIAGE_RETURN].code ||
+                         std::any_of(each.fix.edits.begin(), each.fix.edits.end(), removes_returns);
+    if (about_returns)
+        add(each.fix, {certainty::certain, std::exchange(returns, {})});
     to(std::move(each));
+}
+
+/* Whether a finding may still change. */
+bool source_check::is_open(warning_id id, int at_line) const {
+    return id == CARRIAGE_RETURN || recover.may_retract(id, at_line);
 }
 
 totals source_check::run() {

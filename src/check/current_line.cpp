@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <cstring>
 #include <functional>
+#include <utility>
 
 namespace check {
 
@@ -19,6 +20,7 @@ bool is_within(const char *p, const char *begin, const char *end) {
 } // namespace
 
 void current_line::read(const source_line &source, int line_number) {
+    characters_before = fills_piece ? characters_before + text::characters_in(raw) : 0;
     size_t length = std::min(static_cast<size_t>(source.end - source.begin), read_bytes.size());
     memcpy(read_bytes.data(), source.begin, length);
     raw = {read_bytes.data(), length};
@@ -26,6 +28,7 @@ void current_line::read(const source_line &source, int line_number) {
     number = line_number;
     continues = fills_piece;
     fills_piece = raw.size() == LINE_MAX_CHARS;
+    has_newline = source.read_end > source.end;
     if (continues)
         rests.push_back(number);
 }
@@ -91,8 +94,35 @@ void current_line::find_in_file(place &at) const {
 edit current_line::replacement(place part, std::string_view source, std::string_view by) const {
     find_in_file(part);
     size_t character = text::characters_in(source.substr(0, part.column - 1)) + 1;
-    return {part.file_line, part.column, character, std::string(source.substr(part.column - 1, part.length)),
+    if (part.line == number)
+        character += characters_before;
+    return {part.file_line, part.file_column, character, std::string(source.substr(part.column - 1, part.length)),
             std::string(by)};
+}
+
+std::optional<edit> current_line::without_returns() const {
+    size_t kept = raw.find_last_not_of('\r') + 1;
+    if (kept == raw.size() || fills_piece)
+        return std::nullopt;
+    return replacement({number, kept + 1, raw.size() - kept}, raw, {});
+}
+
+edit current_line::removed() const {
+    edit whole = replacement({number, 1, raw.size()}, raw, {});
+    whole.removed += '\n';
+    return whole;
+}
+
+edit current_line::followed_by(std::string lines) const {
+    edit added = replacement({number, 1, 0}, raw, {});
+    if (has_newline) {
+        ++added.line;
+    } else {
+        added = replacement({number, raw.size() + 1, 0}, raw, {});
+        lines.insert(0, "\n").pop_back();
+    }
+    added.text = std::move(lines);
+    return added;
 }
 
 correction current_line::renamed(const place &part, std::string_view source, const language::guess &meant) const {

@@ -10,6 +10,7 @@
 #include <array>
 #include <cstddef>
 #include <functional>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -45,6 +46,10 @@ public:
     }
     /* All of the text. */
     place all() const;
+    /* A part of the text. */
+    place part(std::string_view in_text) const {
+        return {number, column_of(in_text.data()), in_text.size()};
+    }
     /* Part of the value of an attribute of this line. */
     place part_of(const attr_place &attr, size_t offset, size_t length) const {
         return {number, column_of(attr.value) + offset, length};
@@ -58,12 +63,23 @@ public:
 
     /* Says where in the file a place of this line, or of one before it, is. */
     void find_in_file(place &at) const;
-    /* The change that puts a text in the place of a part of this line, or of one before it, of which it is given the
-     * text. The line is not the rest of one that is too long. */
+    /* The change that puts a text in the place of a part of this line, or of one before it that is not the rest of one
+     * that is too long. source: the line's text */
     edit replacement(place part, std::string_view source, std::string_view by) const;
     /* The correction that puts the name that was meant in the place of a part of a line. None if there is no such name,
      * or if the line is the rest of one that is too long. */
     correction renamed(const place &part, std::string_view source, const language::guess &meant) const;
+    /* The removal of carriage returns at the end of this line; nothing if it has none. */
+    std::optional<edit> without_returns() const;
+    /* The removal of this line, newline included. */
+    edit removed() const;
+    /* The insertion of whole lines, each with its newline, after this one. */
+    edit followed_by(std::string lines) const;
+
+    /* The line is a part of one that is too long. */
+    bool is_piece() const {
+        return continues || fills_piece;
+    }
 
     /* Where in the line its first carriage return is; at or after its end if it has none. */
     size_t carriage_return() const {
@@ -92,7 +108,9 @@ private:
     std::array<char, 512> copy;        /* holds a replaced text */
     std::ptrdiff_t copy_added = 0;
     bool fills_piece = false;
-    std::vector<int> rests; /* numbers of the lines that are the rests of others */
+    bool has_newline = false;     /* false for the last line of a source that does not end with one */
+    size_t characters_before = 0; /* in the pieces of the line before this one */
+    std::vector<int> rests;       /* numbers of the lines that are the rests of others */
 };
 
 } // namespace check

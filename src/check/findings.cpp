@@ -48,6 +48,13 @@ void findings::retract(warning_id id, int line) {
     }
 }
 
+finding *findings::waiting_error(message_id id, int line) {
+    auto found = std::find_if(waiting.begin(), waiting.end(), [&](const entry &each) {
+        return each.id == WARNING_COUNT && each.found.at.line == line && each.found.code == message_of(id).code;
+    });
+    return found == waiting.end() ? nullptr : &found->found;
+}
+
 void findings::sort() {
     auto before = [](const entry &a, const entry &b) {
         return std::pair(a.found.at.line, !a.found.error) < std::pair(b.found.at.line, !b.found.error);

@@ -21,12 +21,15 @@ public:
 
     findings(sink handed_to, question is_open) : to(std::move(handed_to)), may_retract(std::move(is_open)) {}
 
-    /* The finding is to be completed with notes before the next one is added. */
+    /* The finding is to be completed before the next one is added. */
     finding &error(const message &known, const place &at, std::string_view source, std::string text);
     /* With a note, if it has a text. */
     finding &warn(const warning &known, const place &at, std::string_view source, std::string text, note more);
     /* Takes back the warnings of a line, which an error now explains. */
     void retract(warning_id id, int line);
+
+    /* An error of a line that is completed later. Null if it has been handed over. */
+    finding *waiting_error(message_id id, int line);
 
     size_t errors() const {
         return count.errors;

@@ -17,6 +17,7 @@ bool is_given(const knowledge &known, int kind, std::string_view attribute) {
 
 language::guess attribute_meant(const knowledge &known, int kind, std::string_view name) {
     using language::likeness;
+    name = name.substr(0, name.find_last_not_of(" \t") + 1);
     language::guess meant = language::attribute_meant_by(name, table_of(kind));
     auto given = [&](std::string_view each) { return is_given(known, kind, each); };
     if (meant.how == likeness::word)

@@ -9,7 +9,7 @@
 namespace check {
 
 /* The attribute that a name in the latest stanza of a kind was meant to be. It is not certain to be one that the stanza
- * has given already and may give only once. */
+ * has given already and may give only once. Blanks after the name do not count. */
 language::guess attribute_meant(const knowledge &known, int kind, std::string_view name);
 
 } // namespace check

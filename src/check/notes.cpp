@@ -2,6 +2,7 @@
 
 #include "check/notes.h"
 
+#include "check/edits.h"
 #include "check/meant.h"
 #include "check/numbers.h"
 #include "check/value_notes.h"
@@ -11,6 +12,8 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <optional>
+#include <utility>
 #include <vector>
 
 namespace check {
@@ -45,6 +48,10 @@ struct noting {
     /* What was meant takes the place of what is marked. */
     void replace(const language::guess &meant) {
         found.fix = see.line.renamed(found.at, found.source, meant);
+    }
+    /* An element's type that was meant takes the place of the one given, besides what is replaced already. */
+    void replace_type(const mention &given) {
+        check::add(found.fix, see.line.renamed(given.at, given.source, language::type_meant_by(given.text, true)));
     }
     void suggest(std::string_view given, const language::name_list &names) {
         add_here(suggestion(given, names));
@@ -91,13 +98,14 @@ void unknown_name(noting &n) {
     std::string given = n.marked();
     const srtable_ctrl &table = table_of(n.kind);
     std::string_view trimmed = std::string_view(given).substr(0, given.find_last_not_of(" \t") + 1);
-    if (trimmed.size() < given.size() && find_attr(table, trimmed) != nullptr)
-        return n.add_here("blanks in front of the = belong to the name");
     kind_set others = language::kinds_with(given);
-    language::guess meant = attribute_meant(n.see.known, n.kind, given);
+    language::guess meant = attribute_meant(n.see.known, n.kind, trimmed);
     if (meant.names.empty() && others.count() == 1)
         return n.add_here(belongs_to(others));
-    n.add_here(suggestion(meant, language::attribute_names(table)));
+    if (trimmed.size() < given.size() && !meant.names.empty())
+        n.add_here("blanks in front of the = belong to the name");
+    if (meant.name() != trimmed)
+        n.add_here(suggestion(meant, language::attribute_names(table)));
     n.replace(meant);
 }
 
@@ -147,13 +155,18 @@ void overflowed(noting &n) {
           "the number that overflows here makes later ones that are 0, or the limit of their type, invalid");
 }
 
+void unknown_element_type(noting &n, const mention &given) {
+    n.add(given.at, "unknown data type: " + language::type_suggestion(given.text, true));
+    n.replace_type(given);
+}
+
 void bad_value(noting &n) {
     vx_data_type_t type = n.see.compiler.data_type();
     const mention &given_type = n.stanza().data_type;
     if (is_numeric(type) && n.see.known.overflow_line != 0)
         overflowed(n);
     else if (type == VX_UNKNOWN)
-        n.add(given_type.at, "unknown data type: " + language::type_suggestion(given_type.text, true));
+        unknown_element_type(n, given_type);
     else
         n.add_here(value_note(n.see.attr(), type, n.see.value()));
 }
@@ -163,8 +176,13 @@ void no_equals(noting &n) {
         n.add_here(no_equals_note(table_of(n.kind), n.marked()));
 }
 
+/* The quote is not the last character if a carriage return follows. */
 void open_quote(noting &n) {
-    n.add_here(open_quote_note(n.marked()));
+    std::optional<edit> removal = n.see.line.without_returns();
+    if (!removal || !n.see.line.whole().ends_with("\"" + removal->removed))
+        return n.add_here(open_quote_note(n.marked()));
+    n.add_here("the line ends with a carriage return, which belongs to the value");
+    n.found.fix = {certainty::certain, {std::move(*removal)}};
 }
 
 void no_value(noting &n) {
@@ -219,8 +237,10 @@ void bad_default(noting &n) {
     constexpr const char *NO_SBS = "only elements of inputs and responses can be of type `SBS`: choose another type";
     if (!is_sd_kind(n.kind))
         return n.show(n.stanza().data_type, NO_SBS);
-    for (const mention &odd : n.see.known.run.odd_types)
+    for (const mention &odd : n.see.known.run.odd_types) {
         n.show(odd, odd.text == "SBS" ? NO_SBS : "unknown data type: " + language::type_suggestion(odd.text, true));
+        n.replace_type(odd);
+    }
 }
 
 void no_manager(noting &n) {

@@ -39,7 +39,8 @@ void recovery::take_attribute() {
     try {
         compiler.take_attribute(line.text);
     } catch (const fatal_exit &failure) {
-        return recover_attribute(failure);
+        recover_attribute(failure);
+        return settle_order();
     }
     if (compiler.conversion_errno() != errno_before)
         known.overflow_line = line.number;
@@ -50,6 +51,23 @@ void recovery::take_attribute() {
     if (!known.stanza().misplaced)
         note_value();
     warned.attribute(see);
+    settle_order();
+}
+
+/* Optional attributes that came too early are moved after the last required one. A line in pieces is not moved. */
+void recovery::settle_order() {
+    if (!early.is_open())
+        return;
+    if (compiler.is_complete(known.kind)) {
+        if (finding *error = found.waiting_error(MSG_OPTIONAL_TOO_EARLY, early.first_line()))
+            error->fix = early.after(line);
+        return early.close();
+    }
+    const table_attrs *attr = attr_meant();
+    if (line.is_piece())
+        early.close();
+    else if (attr != nullptr && (attr->req_bit & OPTIONAL) != 0)
+        early.move(line);
 }
 
 /* An attribute that the incomplete stanza before this one has as well, or cannot have, is none of its missing lines. */
@@ -67,7 +85,7 @@ void recovery::settle_split() {
 /* ---- Errors ---------------------------------------------------------------------------------------------------- */
 
 void recovery::recover_attribute(const fatal_exit &failure) {
-    if (std::string_view meant = header_meant(failure); !meant.empty())
+    if (language::guess meant = header_meant(failure); !meant.name().empty())
         return indented_header(meant, failure);
     if (known.kind < 0)
         return lose_first_header(failure);
@@ -77,6 +95,8 @@ void recovery::recover_attribute(const fatal_exit &failure) {
         report_with_notes(failure, line.marked(message_of(failure.id).mark, latest, failure.detail1), known.kind);
         if (blames_overflow(failure, see))
             found.retract(NARROWED, known.overflow_line);
+        if (failure.id == MSG_OPTIONAL_TOO_EARLY)
+            early.open(line.number);
     }
     recover_value(failure, consequence);
     compiler.set_broken(known.kind);
@@ -88,18 +108,22 @@ void recovery::recover_attribute(const fatal_exit &failure) {
 }
 
 /* The stanza kind that a line is nearly the name of, although it begins with a blank. */
-std::string_view recovery::header_meant(const fatal_exit &failure) const {
-    bool whole = failure.id == MSG_NO_EQUALS || failure.id == MSG_NO_STANZA;
-    return whole ? language::near_miss(line.whole(), language::stanza_names()) : std::string_view();
+language::guess recovery::header_meant(const fatal_exit &failure) const {
+    if (failure.id != MSG_NO_EQUALS && failure.id != MSG_NO_STANZA)
+        return {};
+    language::guess meant = language::meant_by(line.whole(), language::stanza_names());
+    return meant.how == language::likeness::word ? language::guess() : meant;
 }
 
-void recovery::indented_header(std::string_view meant, const fatal_exit &failure) {
-    bool exact = std::string_view(line.text.name) == meant;
+void recovery::indented_header(const language::guess &meant, const fatal_exit &failure) {
+    bool exact = std::string_view(line.text.name) == meant.name();
     finding &error = report(failure, line.all());
     error.notes.push_back({line.all(), "a stanza begins in column 1"});
     if (!exact)
         error.notes.push_back({line.all(), language::suggestion(line.text.name, language::stanza_names())});
-    take_header(line.replaced(meant), !exact);
+    place from_column_1 = {line.number, 1, line.all().column - 1 + line.all().length};
+    error.fix = line.renamed(from_column_1, line.raw, meant);
+    take_header(line.replaced(meant.name()), !exact);
 }
 
 /* After an attribute line in front of any header. */
@@ -115,13 +139,16 @@ std::string_view recovery::name_given() const {
     return line.at(see.name_place());
 }
 
-/* The attribute type of a line that could not be read; nothing if its name is like none of the kind's. */
-std::optional<int> recovery::type_meant() const {
+/* The attribute of the current line; null if its name is like none of the kind's. */
+const table_attrs *recovery::attr_meant() const {
     const srtable_ctrl &table = table_of(known.kind);
     std::string_view name = name_given();
     const table_attrs *attr = find_attr(table, name);
-    if (attr == nullptr)
-        attr = find_attr(table, attribute_meant(known, known.kind, name).name());
+    return attr != nullptr ? attr : find_attr(table, attribute_meant(known, known.kind, name).name());
+}
+
+std::optional<int> recovery::type_meant() const {
+    const table_attrs *attr = attr_meant();
     return attr == nullptr ? std::nullopt : std::optional(attr->ta_type);
 }
 

@@ -1,5 +1,7 @@
 /* recover_header.cpp: takes headers, and continues after one that is refused. */
 
+#include "check/edits.h"
+#include "check/meant.h"
 #include "check/recovery.h"
 #include "language/limits.h"
 #include "language/names.h"
@@ -166,25 +168,26 @@ void recovery::give_up_map() {
 /* A header that names no kind: it is misspelt, an attribute line without its blank, or lost. */
 void recovery::unknown_header(const attr_text &text, const fatal_exit &failure) {
     std::string_view name(text.name, static_cast<size_t>(text.end - text.name));
-    std::string_view front = name.substr(0, name.find('='));
     if (line.continues && error_line + 1 == line.number)
         return; /* the line that this one continues has been reported */
     finding &error = report(failure, line.all());
     auto add = [&](std::string note) { error.notes.push_back({line.all(), std::move(note)}); };
-    if (std::optional<std::string> stripped = stripped_header(error, name))
-        return take_header(line.replaced(*stripped), false);
+    std::string_view bare = bare_header(error, name);
+    std::string_view front = bare.substr(0, bare.find('='));
+    if (bare.empty())
+        return;
+    if (bare.size() < name.size() && is_header(bare))
+        return take_header(line.replaced(bare), false);
     if (line.continues)
         return add("this is the rest of a line of more than " + std::to_string(LINE_MAX_CHARS - 1) + " characters");
-    if (take_joined_header(name, error))
+    if (take_joined_header(bare, error))
         return;
-    if (front.size() < name.size() && !is_header(front) && known.kind >= 0) {
-        add("an attribute line begins with a blank or a tab");
-        return take_quietly(std::string("\t").append(name), 1);
-    }
-    add(language::suggestion(name, language::stanza_names()));
+    if (front.size() < bare.size() && !is_header(front) && known.kind >= 0)
+        return column_1_attribute(error, bare);
+    add(language::suggestion(bare, language::stanza_names()));
     language::guess meant = language::meant_by(front, language::stanza_names());
-    if (front.size() == name.size())
-        error.fix = line.renamed(line.all(), line.raw, meant);
+    if (front.size() == bare.size())
+        check::add(error.fix, line.renamed(line.part(bare), line.raw, meant));
     if (!meant.name().empty())
         return take_header(line.replaced(meant.name()), true);
     lose_stanza();
@@ -203,22 +206,35 @@ bool recovery::take_joined_header(std::string_view name, finding &error) {
     return true;
 }
 
-/* A header without what cannot be seen of it; nothing if that is not what is wrong with it. */
-std::optional<std::string> recovery::stripped_header(finding &error, std::string_view name) {
-    size_t length = name.size();
+/* A header's name without what cannot be seen of it. */
+std::string_view recovery::bare_header(finding &error, std::string_view name) {
+    auto add = [&](std::string note, edit removal) {
+        error.notes.push_back({line.all(), std::move(note)});
+        check::add(error.fix, {certainty::certain, {std::move(removal)}});
+    };
     if (line.raw.starts_with(BYTE_ORDER_MARK)) {
         name.remove_prefix(BYTE_ORDER_MARK.size());
-        error.notes.push_back({line.all(), "a byte order mark is in front, which belongs to the name"});
+        add("a byte order mark is in front, which belongs to the name",
+            line.replacement({line.number, 1, BYTE_ORDER_MARK.size()}, line.raw, {}));
     }
-    if (line.raw.ends_with('\r')) {
+    if (std::optional<edit> removal = line.without_returns(); removal && name.ends_with('\r')) {
         strip_returns = true;
         name = name.substr(0, name.find_last_not_of('\r') + 1);
-        error.notes.push_back({line.all(), "the line ends with a carriage return, which belongs to the name; further "
-                                           "ones are passed over"});
+        add("the line ends with a carriage return, which belongs to the name; further ones are passed over",
+            std::move(*removal));
     }
-    if (name.size() == length || !is_header(name))
-        return std::nullopt;
-    return std::string(name);
+    return name;
+}
+
+/* An attribute line without the blank or tab that it begins with. */
+void recovery::column_1_attribute(finding &error, std::string_view text) {
+    error.notes.push_back({line.all(), "an attribute line begins with a blank or a tab"});
+    std::string_view name = text.substr(0, text.find('='));
+    correction indented = line.renamed(line.part(name), line.raw, attribute_meant(known, known.kind, name));
+    for (edit &each : indented.edits)
+        each.text.insert(0, "\t");
+    check::add(error.fix, std::move(indented));
+    take_quietly(std::string("\t").append(text), 1);
 }
 
 /* A stanza of which nothing is known begins. */

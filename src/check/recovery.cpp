@@ -109,6 +109,7 @@ int recovery::failed_kind(const fatal_exit &failure) const {
 /* ---- Stanzas and records -------------------------------------------------------------------------------------- */
 
 void recovery::end_stanza(int next_kind) {
+    early.close();
     warned.stanza_end(see, next_kind);
     if (known.kind >= 0 && is_sd_kind(known.kind) && !lacking_unnoticed(see, next_kind).empty())
         known.run.without_index.push_back({known.stanza().header, {}, known.stanza().source});
@@ -148,6 +149,7 @@ void recovery::settle_broken(int next_kind) {
 }
 
 void recovery::skip_stanza() {
+    early.close();
     known.skipping = true;
     known.kind = NO_KIND;
 }

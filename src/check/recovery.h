@@ -3,6 +3,7 @@
 #ifndef CDGEN_CHECK_RECOVERY_H
 #define CDGEN_CHECK_RECOVERY_H
 
+#include "check/early_lines.h"
 #include "check/findings.h"
 #include "check/view.h"
 #include "check/warnings/registry.h"
@@ -69,17 +70,20 @@ private:
     void give_up_map();
     void unknown_header(const attr_text &text, const fatal_exit &failure);
     bool take_joined_header(std::string_view name, finding &error);
-    std::optional<std::string> stripped_header(finding &found, std::string_view name);
+    std::string_view bare_header(finding &found, std::string_view name);
+    void column_1_attribute(finding &error, std::string_view text);
     void lose_stanza();
 
     /* Attribute lines (recover_attribute.cpp). */
     void recover_attribute(const fatal_exit &failure);
     void settle_split();
-    std::string_view header_meant(const fatal_exit &failure) const;
-    void indented_header(std::string_view meant, const fatal_exit &failure);
+    language::guess header_meant(const fatal_exit &failure) const;
+    void indented_header(const language::guess &meant, const fatal_exit &failure);
     void lose_first_header(const fatal_exit &failure);
     std::string_view name_given() const;
+    const table_attrs *attr_meant() const;
     std::optional<int> type_meant() const;
+    void settle_order();
     bool follows(const fatal_exit &failure);
     bool is_foreign_value(const fatal_exit &failure) const;
     bool is_foreign_property(const fatal_exit &failure) const;
@@ -102,6 +106,7 @@ private:
     bool header_reported = false;    /* as standing in a wrong place */
     int error_line = 0;              /* of the latest error */
     bool strip_returns = false;
+    early_lines early;       /* of the current stanza */
     bool index_lost = false; /* the next index of the run is not known */
     int other_index = -1;    /* after a wrong index: another one that may be right as well; -1: none */
     int awaited_index = -1;  /* after a wrong index: the one that was expected instead, which may follow; -1: none */

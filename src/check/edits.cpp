@@ -1,0 +1,102 @@
+/* edits.cpp: changes of a source. */
+
+#include "check/edits.h"
+
+#include <algorithm>
+#include <iterator>
+#include <set>
+#include <tuple>
+#include <utility>
+
+namespace check {
+
+namespace {
+
+using place_in_file = std::pair<int, size_t>; /* line, column */
+
+place_in_file begin_of(const edit &each) {
+    return {each.line, each.column};
+}
+
+/* Behind the bytes that are removed. A newline is the last one of them. */
+place_in_file end_of(const edit &each) {
+    if (each.removed.ends_with('\n'))
+        return {each.line + 1, 1};
+    return {each.line, each.column + each.removed.size()};
+}
+
+bool comes_first(const edit &a, const edit &b) {
+    return begin_of(a) < begin_of(b);
+}
+
+/* What has been changed so far, by its beginning. */
+using changed_places = std::set<std::pair<place_in_file, place_in_file>>;
+
+/* Insertions at the same place are not compatible either: their order would not be known. */
+bool is_free(const changed_places &changed, const edit &each) {
+    auto next = changed.lower_bound({begin_of(each), begin_of(each)});
+    bool free_after = next == changed.end() || (end_of(each) <= next->first && begin_of(each) < next->first);
+    return free_after && (next == changed.begin() || std::prev(next)->second <= begin_of(each));
+}
+
+/* Where each line begins. */
+std::vector<size_t> lines_of(std::string_view source) {
+    std::vector<size_t> begins = {0};
+    for (size_t at = source.find('\n'); at != std::string_view::npos; at = source.find('\n', at + 1))
+        begins.push_back(at + 1);
+    return begins;
+}
+
+std::vector<edit> in_order(std::span<const correction> all) {
+    std::vector<edit> edits;
+    for (const correction &each : all)
+        edits.insert(edits.end(), each.edits.begin(), each.edits.end());
+    std::stable_sort(edits.begin(), edits.end(), comes_first);
+    return edits;
+}
+
+} // namespace
+
+void add(correction &to, correction more) {
+    if (more.edits.empty())
+        return;
+    to.sure = to.edits.empty() ? more.sure : std::min(to.sure, more.sure);
+    std::move(more.edits.begin(), more.edits.end(), std::back_inserter(to.edits));
+    std::stable_sort(to.edits.begin(), to.edits.end(), comes_first);
+    auto same = [](const edit &a, const edit &b) {
+        return begin_of(a) == begin_of(b) && a.removed == b.removed && a.text == b.text;
+    };
+    to.edits.erase(std::unique(to.edits.begin(), to.edits.end(), same), to.edits.end());
+}
+
+std::vector<correction> compatible(std::vector<correction> all) {
+    changed_places changed;
+    std::erase_if(all, [&](const correction &each) {
+        bool free =
+            std::all_of(each.edits.begin(), each.edits.end(), [&](const edit &one) { return is_free(changed, one); });
+        for (const edit &one : each.edits)
+            if (free)
+                changed.insert({begin_of(one), end_of(one)});
+        return !free || each.edits.empty();
+    });
+    return all;
+}
+
+std::optional<std::string> corrected(std::string_view source, std::span<const correction> all) {
+    std::vector<size_t> lines = lines_of(source);
+    std::string made;
+    size_t taken = 0;
+    for (const edit &each : in_order(all)) {
+        auto line = static_cast<size_t>(each.line) - 1;
+        if (line >= lines.size() || each.column > source.size() - lines[line] + 1)
+            return std::nullopt;
+        size_t begin = lines[line] + each.column - 1;
+        if (begin < taken || source.substr(begin, each.removed.size()) != each.removed)
+            return std::nullopt;
+        made.append(source.substr(taken, begin - taken)).append(each.text);
+        taken = begin + each.removed.size();
+    }
+    return made.append(source.substr(taken));
+}
+
+} // namespace check

@@ -1,0 +1,26 @@
+/* fix.h: corrects what a program can correct in a source. */
+#ifndef CDGEN_CHECK_FIX_H
+#define CDGEN_CHECK_FIX_H
+
+#include "check/check.h"
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+
+namespace check {
+
+struct fixed_source {
+    std::string text;
+    size_t corrected = 0; /* corrections that were made */
+    size_t dropped = 0;   /* corrections that were not, because more errors would be found with them */
+};
+
+/* Makes the certain corrections of the errors, and of the wanted warnings. The text has no more errors than the bytes
+ * had. What becomes visible by a correction is corrected too, so fixing the text again changes nothing. Throws
+ * cannot_check, with the source's name, if memory runs out. */
+fixed_source fix_bytes(std::string_view bytes, const std::string &name, const warning_set &wanted);
+
+} // namespace check
+
+#endif

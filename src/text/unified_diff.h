@@ -1,0 +1,17 @@
+/* unified_diff.h: what changed in a text, as patch(1) reads it. */
+#ifndef CDGEN_TEXT_UNIFIED_DIFF_H
+#define CDGEN_TEXT_UNIFIED_DIFF_H
+
+#include <string>
+#include <string_view>
+
+namespace text {
+
+/* Empty if nothing changed. Meant for few changes in many lines, and takes time in proportion to the lines; with large
+ * changes it may show more lines than necessary. */
+std::string unified_diff(std::string_view old_name, std::string_view new_name, std::string_view before,
+                         std::string_view after);
+
+} // namespace text
+
+#endif

@@ -1,0 +1,55 @@
+/* What changed in a text, as patch(1) reads it. */
+
+#include "text/unified_diff.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+std::string diff(std::string_view before, std::string_view after) {
+    return text::unified_diff("a", "b", before, after);
+}
+
+TEST(UnifiedDiff, IsEmptyWithoutAChange) {
+    EXPECT_EQ(diff("", ""), "");
+    EXPECT_EQ(diff("1\n2\n", "1\n2\n"), "");
+}
+
+TEST(UnifiedDiff, ShowsThreeLinesAroundAChange) {
+    EXPECT_EQ(diff("1\n2\n3\n4\n5\n6\n7\n8\n9\n", "1\n2\n3\n4\nfive\n6\n7\n8\n9\n"),
+              "--- a\n+++ b\n@@ -2,7 +2,7 @@\n 2\n 3\n 4\n-5\n+five\n 6\n 7\n 8\n");
+}
+
+TEST(UnifiedDiff, ShowsAMovedLine) {
+    EXPECT_EQ(diff("1\n2\n3\n", "2\n3\n1\n"), "--- a\n+++ b\n@@ -1,3 +1,3 @@\n-1\n 2\n 3\n+1\n");
+}
+
+TEST(UnifiedDiff, CountsNoLinesFromTheLineInFront) {
+    EXPECT_EQ(diff("", "1\n"), "--- a\n+++ b\n@@ -0,0 +1 @@\n+1\n");
+    EXPECT_EQ(diff("1\n2\n", ""), "--- a\n+++ b\n@@ -1,2 +0,0 @@\n-1\n-2\n");
+}
+
+TEST(UnifiedDiff, JoinsChangesThatShareLines) {
+    EXPECT_EQ(diff("a\n1\n2\n3\n4\n5\n6\nb\n", "A\n1\n2\n3\n4\n5\n6\nB\n"),
+              "--- a\n+++ b\n@@ -1,8 +1,8 @@\n-a\n+A\n 1\n 2\n 3\n 4\n 5\n 6\n-b\n+B\n");
+    EXPECT_EQ(diff("a\n1\n2\n3\n4\n5\n6\n7\nb\n", "A\n1\n2\n3\n4\n5\n6\n7\nB\n"),
+              "--- a\n+++ b\n@@ -1,4 +1,4 @@\n-a\n+A\n 1\n 2\n 3\n@@ -6,4 +6,4 @@\n 5\n 6\n 7\n-b\n+B\n");
+}
+
+TEST(UnifiedDiff, SaysWhereANewlineIsMissing) {
+    EXPECT_EQ(diff("1\n2", "1\n2\n"), "--- a\n+++ b\n@@ -1,2 +1,2 @@\n 1\n-2\n\\ No newline at end of file\n+2\n");
+}
+
+TEST(UnifiedDiff, TakesManyChangedLines) {
+    std::string before;
+    std::string after;
+    for (int i = 0; i < 300; ++i) {
+        before += std::to_string(i) + "\r\n";
+        after += std::to_string(i) + "\n";
+    }
+    std::string made = diff(before, after);
+    EXPECT_TRUE(made.starts_with("--- a\n+++ b\n@@ -1,300 +1,300 @@\n-0\r\n-1\r\n"));
+    EXPECT_TRUE(made.ends_with("+298\n+299\n"));
+}
+
+} // namespace

@@ -215,6 +215,10 @@ struct rule {
     severity level;
     /** What is wrong, such as `wrong checksum`. */
     std::string_view title;
+    /** How it comes about: sentences. */
+    std::string_view cause = {};
+    /** What to do about it: sentences. */
+    std::string_view cure = {};
 };
 
 /** Code of the rule about the checksum. A file that breaks only this rule and CODE_RESERVED can still be read. */

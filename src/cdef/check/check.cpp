@@ -3,6 +3,7 @@
 #include "check/check.h"
 
 #include "cdef/cdef.h"
+#include "cdef/check/fix.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/forms.h"
 #include "cdef/support/input.h"
@@ -11,6 +12,7 @@
 
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
 #include <cstdio>
 #include <memory>
 #include <string>
@@ -29,6 +31,8 @@ struct check_options {
     std::vector<std::string> wanted;
     std::vector<std::string> unwanted;
     bool warnings_count = false; /* as errors do */
+    bool fixes = false;
+    bool changes_nothing = false; /* only shows what would be fixed */
 };
 
 std::vector<std::string> warning_names() {
@@ -70,22 +74,33 @@ std::unique_ptr<report::writer> form_of(const check_options &options) {
     return report::text_form(show_text);
 }
 
-check::totals check_source(const std::string &source, const check::warning_set &wanted, report::writer &to) {
+check::totals check_source(const std::string &source, const check_options &options, report::writer &to) {
+    check::warning_set wanted = chosen(options);
+    auto add = [&to](const check::finding &found) { to.add(found); };
     if (is_database(source))
         throw check::cannot_check(source + ": a database, not a source; 'cdef verify' checks databases");
-    return check::check_file(source, wanted, [&to](const check::finding &found) { to.add(found); });
+    if (options.fixes)
+        return check::check_bytes(fix_source(source, wanted, options.changes_nothing), source, wanted, add);
+    return check::check_file(source, wanted, add);
+}
+
+/* Standard output takes the findings in most forms, so the fixed source or the diff cannot go there too. */
+void require_output(const check_options &options) {
+    bool from_input = std::find(options.sources.begin(), options.sources.end(), "-") != options.sources.end();
+    if (options.fixes && (options.changes_nothing || from_input) && options.form != "text")
+        throw failure("--fix writes to standard output here, and so does --format " + options.form);
 }
 
 /* Checks all sources. */
 int check_all(const check_options &options) {
+    require_output(options);
     std::unique_ptr<report::writer> form = form_of(options);
-    check::warning_set wanted = chosen(options);
     bool pass = true;
     bool read = true;
     for (const std::string &source : options.sources) {
         form->begin_source(source);
         try {
-            check::totals count = check_source(source, wanted, *form);
+            check::totals count = check_source(source, options, *form);
             form->end_source(count);
             pass = pass && count.errors == 0 && (count.warnings == 0 || !options.warnings_count);
         } catch (const check::cannot_check &unreadable) {
@@ -116,6 +131,8 @@ void add_check(CLI::App &app, int &status) {
         ->allow_extra_args(false)
         ->check(CLI::IsMember(warning_names()));
     command->add_flag("--werror", options->warnings_count, "Count warnings as errors");
+    CLI::Option *fix = command->add_flag("--fix", options->fixes, "Correct what is surely meant otherwise");
+    command->add_flag("--dry-run", options->changes_nothing, "Show as a diff what --fix would change")->needs(fix);
     command->footer(
         "Exit status: 0 without errors, 1 with errors (with --werror: or warnings), 2 if a source cannot be "
         "read.");

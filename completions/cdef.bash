@@ -19,6 +19,8 @@ _cdef() {
         local subcommands
         subcommands=$("$1" --help 2>/dev/null | sed -n '/^Subcommands:/,$ s/^  \([a-z][^ ]*\).*/\1/p')
         mapfile -t COMPREPLY < <(compgen -W "$subcommands" -- "$2")
+    elif [[ $subcommand == explain ]]; then
+        mapfile -t COMPREPLY < <(compgen -W "$("$1" explain 2>/dev/null | sed 's/ .*//')" -- "$2")
     else
         compopt -o filenames 2>/dev/null
         mapfile -t COMPREPLY < <(compgen -f -X '!*.cdef*' -- "$2"; compgen -d -- "$2")

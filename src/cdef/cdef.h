@@ -14,6 +14,7 @@ void add_source(CLI::App &app, int &status);
 void add_diff(CLI::App &app, int &status);
 void add_dump(CLI::App &app, int &status);
 void add_check(CLI::App &app, int &status);
+void add_explain(CLI::App &app, int &status);
 
 /* The program; returns its exit status. */
 int cdef_main(int argc, char **argv);

@@ -43,7 +43,7 @@ def images():
 
 def test_schemas():
     """They are schemas, and each subcommand that writes JSON has one."""
-    same(sorted(SCHEMAS), [f"cdef-{name}.schema.json" for name in ("check", "diff", "dump", "verify")], "names")
+    same(sorted(SCHEMAS), [f"cdef-{name}.schema.json" for name in ("check", "diff", "dump", "explain", "verify")], "names")
     for schema in SCHEMAS.values():
         jsonschema.Draft7Validator.check_schema(schema)
 
@@ -59,6 +59,14 @@ def test_verify():
     """All images, sound or not, and names of nothing."""
     data = document("verify", "--format", "json", *images(), "none.cdef", CASES / "disk.cdefsrc")
     same((data["schema"], len(data["files"])), ("cdef-verify.schema.json", len(images()) + 2), "schema, files")
+
+
+def test_explain():
+    """All codes, and some."""
+    data = document("explain", "--format", "json")
+    same((data["schema"], data["codes"][0]["code"]), ("cdef-explain.schema.json", "S101"), "schema, first code")
+    data = document("explain", "--json", "CDB104", "octal")
+    same([each["code"] for each in data["codes"]], ["CDB104", "S509"], "codes")
 
 
 @pytest.mark.parametrize("options", [(), ("--offsets",)])

@@ -62,6 +62,9 @@ class Offers:
                 with self.subTest(subcommand, option=option):
                     self.assertEqual(self.offered(f"cdef {subcommand} {option} "), known)
 
+    def test_codes_for_explain(self):
+        self.assertEqual(self.offered("cdef explain S50"), {f"S50{number}" for number in range(1, 10)})
+
     def test_databases_for_a_subcommand(self):
         offered = self.offered("cdef verify ")
         self.assertLessEqual({"Disk.cdef", "Tape Drive.cdef"}, offered)

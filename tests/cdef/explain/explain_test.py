@@ -1,0 +1,95 @@
+"""Test `cdef explain`. That the examples have their codes, a unit test shows."""
+
+import json
+import subprocess
+
+from compare import same
+from programs import PROGRAMS
+
+
+def explain(*operands):
+    """Status, output and messages of `cdef explain`."""
+    result = subprocess.run([PROGRAMS.cdef, "explain", *operands], capture_output=True, timeout=60, check=False)
+    return result.returncode, result.stdout.decode(), result.stderr.decode()
+
+
+S206 = """S206: error: Range requires two values
+
+Cause:
+  A `Range` has no comma.
+
+Cure:
+  Write `low,high`.
+
+Example:
+    DynamicResourceAttribute
+    \t...
+    \tDataType=Int32
+    \tRange=100
+
+Cured:
+    DynamicResourceAttribute
+    \t...
+    \tDataType=Int32
+    \tRange=0,100
+"""
+
+CDB104 = """CDB104: error: wrong checksum
+
+Cause:
+  Something was changed after the file was made.
+
+Cure:
+  Compile the source again, or take another copy of the file: this one is
+  damaged.
+"""
+
+
+def test_code():
+    """Cause, cure and example, for codes in any case."""
+    same(explain("S206"), (0, S206, ""), "S206")
+    same(explain("s206"), (0, S206, ""), "s206")
+    same(explain("CDB104"), (0, CDB104, ""), "CDB104")
+
+
+def test_several_codes():
+    """Each after the other."""
+    same(explain("S206", "CDB104"), (0, S206 + "\n" + CDB104, ""), "two codes")
+
+
+def test_name_of_a_warning():
+    """The same as its code, which it shows."""
+    same(explain("octal"), explain("S509"), "octal")
+    assert explain("octal")[1].startswith("S509: warning: a leading 0 makes a number octal [octal]\n\nCause:\n")
+
+
+def test_example_that_cannot_be_cured_alone():
+    """It is shown without."""
+    assert "\nExample:\n" in explain("S118")[1] and "\nCured:\n" not in explain("S118")[1]
+
+
+def test_list():
+    """All codes, with what they are."""
+    status, output, errors = explain()
+    lines = output.splitlines()
+    same((status, errors, lines[0]), (0, "", "S101    Invalid table name"), "list")
+    assert "S509    a leading 0 makes a number octal [octal]" in lines
+    assert "CDB104  wrong checksum" in lines
+    assert len(lines) == len(set(lines)) > 100
+
+
+def test_unknown_code():
+    """The nearest one is suggested."""
+    for given, meant in (("S10", "S101"), ("S199", "S201"), ("cdb999", "CDB453"), ("octl", "octal"), ("unbalance", "unbalanced"), ("S9999", "S919")):
+        same(explain(given), (2, "", f"cdef: {given}: no such code; did you mean {meant}?\n"), given)
+    same(explain("S101", "spam"), (2, "", "cdef: spam: no such code; 'cdef explain' lists all\n"), "spam")
+
+
+def test_json():
+    """Whole sources as examples."""
+    status, output, errors = explain("--format", "json", "S302", "S901")
+    one, other = json.loads(output)["codes"]
+    same((status, errors), (0, ""), "status")
+    same(one["title"], "No class-to-manager maps defined", "title")
+    assert one["example"].startswith("ControlDefinition\n") and one["cured"].startswith(one["example"])
+    same((other["code"], other["name"], other["example"], other["cured"]), ("S901", None, None, None), "S901")

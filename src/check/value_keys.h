@@ -10,13 +10,17 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <tuple>
 
 namespace check {
 
 /* A value as it is stored. Numbers compare by their value, texts and bytes as strings of bytes do. Only keys of one
  * type can be compared. */
 struct value_key {
-    auto operator<=>(const value_key &) const = default;
+    bool operator==(const value_key &) const = default;
+    std::strong_ordering operator<=>(const value_key &other) const {
+        return std::tie(number, text) <=> std::tie(other.number, other.text);
+    }
 
     std::int64_t number = 0; /* ascends with the value */
     std::string text;        /* empty for numbers */

@@ -29,6 +29,13 @@ std::string cure(std::string suggestion) {
     return suggestion.empty() ? "define it, or correct the name" : std::move(suggestion);
 }
 
+/* What the names of the source itself were meant to be is never certain. */
+correction likely(const view &see, const mention &given, const language::name_list &names) {
+    correction fix = see.line.renamed(given.at, given.source, language::meant_by(given.text, names));
+    fix.sure = certainty::likely;
+    return fix;
+}
+
 /* The locator is looked up in the last class. */
 class unknown_locator : public watcher {
 public:
@@ -46,11 +53,16 @@ public:
         const first_lines &attributes = see.known.declared.names[SC_PERSISTENT_RESOURCE_ATTRIBUTE];
         if (locator && !attributes.has(locator->text) && !name_lost &&
             !see.known.lost.may_be(SC_PERSISTENT_RESOURCE_ATTRIBUTE))
-            advise(report(locator->at, locator->source, "no `PersistentResourceAttribute` has this name"),
-                   cure(language::suggestion(locator->text, attributes.all())));
+            report_locator(see, attributes.all());
     }
 
 private:
+    void report_locator(const view &see, const language::name_list &names) {
+        finding &found = report(locator->at, locator->source, "no `PersistentResourceAttribute` has this name");
+        advise(found, cure(language::suggestion(locator->text, names)));
+        found.fix = likely(see, *locator, names);
+    }
+
     std::optional<mention> locator;
     bool name_lost = false;
 };
@@ -89,8 +101,10 @@ public:
             if (defined.has(each.text))
                 continue;
             bool suggests = (compared += names.size()) <= COMPARED_MAX;
-            advise(report(each.at, each.source, "no `ResourceVariableClass` has this name"),
-                   cure(suggests ? language::suggestion(each.text, names) : std::string()));
+            finding &found = report(each.at, each.source, "no `ResourceVariableClass` has this name");
+            advise(found, cure(suggests ? language::suggestion(each.text, names) : std::string()));
+            if (suggests)
+                found.fix = likely(see, each, names);
         }
     }
 

@@ -34,6 +34,16 @@ TEST(Edits, AreLikelyFromTheSecondLetterOn) {
     EXPECT_EQ(fixes_in(CLASS + persistent("A", "0", "Strnigg")), "21:11(11) Strnigg -> String likely\n");
 }
 
+TEST(Edits, AreLikelyForNamesOfTheSourceItself) {
+    std::string source = CLASS + persistent("Serial", "0", "String");
+    source.insert(source.find("\tName=Pump"), "\tLocator=Seral\n");
+    EXPECT_EQ(fixes_in(source), "9:10(10) Seral -> Serial likely\n");
+    EXPECT_EQ(fixes_in(CLASS + found_in::dynamic("DynamicResourceAttribute", "L", "0", "\tVariableClass=Slw\n") +
+                       "ResourceVariableClass\n\tVariableClass=Slow\n\tObservationInterval=9\n"
+                       "\tReportingInterval=9\n"),
+              "24:16(16) Slw -> Slow likely\n");
+}
+
 TEST(Edits, DoNotNameATypeThatIsRefused) {
     EXPECT_EQ(fixes_in(CLASS + persistent("A", "0", "SBSS")), "");
 }

@@ -1,10 +1,11 @@
 /* cdef_fuzz: gives arbitrary bytes to each of cdef's subcommands, by its command line.
  *
  * The first byte holds what is done: bits 0 to 3 the form, see forms; of a database, bit 4 sets length and checksum
- * right; of a comparison, bit 5 compares the file with itself. The rest is the file; of a comparison, two bytes, the
- * higher first, are the size of the one file, and what follows them is that file and the other. Whatever the files say,
- * the status is one that the documents name, what is shown is text that no terminal acts upon, JSON is JSON, and what
- * the subcommands say of the same file goes together. */
+ * right; of a source that is checked by form 12, bit 4 corrects it too; of a comparison, bit 5 compares the file with
+ * itself. The rest is the file; of a comparison, two bytes, the higher first, are the size of the one file, and what
+ * follows them is that file and the other. Whatever the files say, the status is one that the documents name, what is
+ * shown is text that no terminal acts upon, JSON is JSON, and what the subcommands say of the same file goes together.
+ */
 
 #include "cdef/cdef.h"
 #include "cdef/support/failure.h"
@@ -354,6 +355,8 @@ void look_at_check(const outcome &came, const bytes &source, const words &form) 
         expect_first(parsed(came.out).at("sources").at(0).at("findings"), compiler.err);
     else if (has("sarif"))
         fuzz::require(parsed(came.out).at("version") == "2.1.0", "no SARIF");
+    else if (has("--fix"))
+        fuzz::require(came.out.empty() || came.out.starts_with("--- "), "no diff");
     else
         fuzz::require(came.out.empty(), "findings on standard output");
 }
@@ -385,6 +388,10 @@ const std::array<form, 16> forms = {{
     {{"check", "--werror"}, look_at_check},
 }};
 
+/* A source's findings are those of the file as it is, whatever would be corrected. */
+const form correcting = {{"check", "--fix", "--dry-run"}, look_at_check};
+constexpr unsigned CORRECTING = 0x1C; /* the first form of check, with bit 4 */
+
 constexpr unsigned WHOLE = 0x10;
 constexpr unsigned SAME = 0x20;
 
@@ -396,7 +403,7 @@ bytes database_of(std::span<const std::byte> data, unsigned options) {
 }
 
 outcome shown(words arguments, const words &paths) {
-    bool is_source = arguments.front() == "source";
+    bool is_source = arguments.front() == "source" || arguments == correcting.arguments;
     arguments.insert(arguments.end(), paths.begin(), paths.end());
     outcome came = cdef_says(arguments);
     if (!is_source) /* texts stand in it as they are */
@@ -423,7 +430,7 @@ void compare(const form &with, std::span<const std::byte> data, unsigned options
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size) {
     if (size == 0)
         return 0;
-    const form &with = forms[data[0] & 0xF];
+    const form &with = (data[0] & 0x1F) == CORRECTING ? correcting : forms[data[0] & 0xF];
     std::span<const std::byte> rest = std::as_bytes(std::span(data, size)).subspan(1);
     if (with.look == nullptr) {
         compare(with, rest, data[0]);

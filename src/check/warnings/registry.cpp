@@ -12,7 +12,7 @@
 
 namespace check {
 
-/* To add a warning: a class in a file of this folder, its maker, a row, and its id. */
+/* To add a warning: a class in a file of this folder, its maker, a row, its id, and an example (examples.cpp). */
 maker make_carriage_return, make_class_bit, make_comma_list, make_comment_in_value, make_cut_short, make_element_type,
     make_group, make_ignored_range, make_incomplete, make_intervals, make_invalid_default, make_long_line,
     make_lost_bytes, make_low_above_high, make_narrowed, make_no_expression, make_no_resource_class, make_number_text,

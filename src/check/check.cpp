@@ -17,6 +17,8 @@ namespace check {
 
 namespace {
 
+constexpr size_t RETURNS_MAX = 65536; /* carriage returns that are removed at once, for the memory that they take */
+
 /* One check of one source, whose name must stay as long. */
 struct source_check {
     source_check(const std::string &name, const warning_set &wanted, const sink &handed_to)
@@ -41,7 +43,7 @@ struct source_check {
 
 void source_check::take(const source_line &source) {
     line.read(source, compiler.line_number());
-    if (std::optional<edit> removal = line.without_returns())
+    if (std::optional<edit> removal = line.without_returns(); removal && returns.size() < RETURNS_MAX)
         returns.push_back(std::move(*removal));
     warned.line(see);
     source_line stripped = source;

@@ -13,7 +13,7 @@ namespace check {
 
 namespace {
 
-constexpr int ROUNDS_MAX = 20; /* in each of them something is corrected */
+constexpr int ROUNDS_MAX = 200; /* in each of them something is corrected; few are needed */
 
 /* One round: the corrections of a text are made, except those with which more errors would be found. */
 class round {

@@ -96,6 +96,14 @@ TEST(Fix, RemovesCarriageReturnsAtTheEndsOfLines) {
     EXPECT_EQ(fixed(within).text, within);
 }
 
+TEST(Fix, RemovesAnyNumberOfCarriageReturns) {
+    std::string empty_lines(70000, '\n');
+    std::string returns;
+    for (size_t i = 0; i < empty_lines.size(); ++i)
+        returns += "\r\n";
+    EXPECT_EQ(fixed(CLASS + returns).text, CLASS + empty_lines);
+}
+
 TEST(Fix, RemovesAByteOrderMark) {
     EXPECT_EQ(fixed("\xEF\xBB\xBF" + CLASS).text, CLASS);
     EXPECT_EQ(fixed("\xEF\xBB\xBF# x\r\n" + CLASS).text, "# x\n" + CLASS);

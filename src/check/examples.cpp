@@ -55,7 +55,10 @@ constexpr frame action = {CONTROL CLASS MAP ACTION, "ResourceAction\n\t...\n", "
 /* ---- The examples, by code -------------------------------------------------------------------------------------- */
 
 constexpr example examples[] = {
-    {"S101", &in_class, "PersistentResorceAttribute\n\tName=Size\n", nullptr},
+    {"S101", &in_class,
+     "PersistentResorceAttribute\n\tName=Size\n\tDescription=3\n\tDisplayName=4\n\tId=0\n\tDataType=Int32\n"
+     "\tVarietyRange=1,1\n",
+     PERSISTENT("Size", "0", "Int32")},
     {"S102", &begins, " ControlDefinition\n\tFileVersion=1.0.0.0\n", "ControlDefinition\n\tFileVersion=1.0.0.0\n"},
     {"S103", &persistent, "\tProperties Public\n", "\tProperties=Public\n"},
     {"S104", &dynamic, "\tExpression=\"Load > 90\n", "\tExpression=\"Load > 90\"\n"},

@@ -144,7 +144,7 @@ std::string suggestion(const guess &meant, const name_list &names) {
         return "did you mean " + listed(meant.names, "or") + "?";
     if (names.empty() || names.size() > LISTED_MAX)
         return {};
-    return "known are " + listed(names);
+    return std::string(KNOWN_NAMES) + listed(names);
 }
 
 std::string suggestion(std::string_view text, const name_list &names) {

@@ -34,6 +34,9 @@ std::string_view near_miss(std::string_view text, const name_list &names);
 /* The near miss of a text; without one, the names that it is a part of. */
 guess meant_by(std::string_view text, const name_list &names);
 
+/* Begins a list of names. It is longer than other notes, and the same for all misspelt names of one kind. */
+inline constexpr std::string_view KNOWN_NAMES = "known are ";
+
 /* "did you mean `Name`?" if there is a guess; else "known are `Name` and `Id`", which is empty if there are no names,
  * or too many to read. */
 std::string suggestion(const guess &meant, const name_list &names);

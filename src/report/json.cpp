@@ -16,6 +16,17 @@ void add_number_or_null(json_writer &to, std::string_view key, size_t number) {
         to.add_number(key, number);
 }
 
+/* Where in the file a place is, if the compiler counts its lines in another way. */
+void add_physical(json_writer &to, const place &at) {
+    if (line_in_file(at) == static_cast<size_t>(at.line))
+        return;
+    to.add_number("physical_line", line_in_file(at));
+    if (at.column == 0)
+        to.add_null("physical_column");
+    else
+        to.add_number("physical_column", at.file_column);
+}
+
 /* source: the place's line, or empty if it is not known; characters are counted in it. */
 void add_place(json_writer &to, const place &at, std::string_view source) {
     constexpr const char *keys[] = {"column", "length", "character_column", "character_length"};
@@ -23,12 +34,33 @@ void add_place(json_writer &to, const place &at, std::string_view source) {
     if (at.column == 0) {
         for (const char *key : keys)
             to.add_null(key);
+        add_physical(to, at);
         return;
     }
     character_range in_characters = characters_of(at, source);
     const size_t numbers[] = {at.column, at.length, in_characters.column, in_characters.length};
     for (size_t i = 0; i < std::size(keys); ++i)
         to.add_number(keys[i], numbers[i]);
+    add_physical(to, at);
+}
+
+void add_fix(json_writer &to, const check::correction &fix) {
+    if (fix.edits.empty())
+        return to.add_null("fix");
+    to.open_object("fix");
+    to.add_text("certainty", name_of(fix.sure));
+    to.open_list("edits");
+    for (const check::edit &made : fix.edits) {
+        to.open_object();
+        to.add_number("line", static_cast<size_t>(made.line));
+        to.add_number("column", made.column);
+        to.add_number("character_column", made.character);
+        to.add_text("removed", made.removed);
+        to.add_text("inserted", made.text);
+        to.close();
+    }
+    to.close();
+    to.close();
 }
 
 class json_writer_of_findings : public writer {
@@ -81,6 +113,7 @@ private:
             to.close();
         }
         to.close();
+        add_fix(to, found.fix);
         to.close();
     }
 

@@ -136,6 +136,8 @@ void json_writer::open(std::string_view key, char start, char end) {
 void json_writer::next(std::string_view key) {
     if (levels.empty())
         return;
+    if (text.size() >= PORTION)
+        write_out();
     if (!levels.back().is_empty)
         text += ',';
     levels.back().is_empty = false;

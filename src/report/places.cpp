@@ -38,19 +38,20 @@ std::string prefix_of(std::string_view file, const place &at) {
     return text + " ";
 }
 
-std::string excerpt_of(const place &at, std::string_view source) {
+std::string excerpt_of(const place &at, std::string_view source, std::string_view colour) {
     constexpr size_t MARGIN = 5;
     if (at.line == 0 || at.column == 0)
         return {};
     std::string number = std::to_string(at.line);
     std::string margin(std::max(number.size(), MARGIN), ' ');
-    return margin.substr(number.size()) + number + " | " + text::masked(source) + "\n" + margin + " | " +
-           carets(source, at) + "\n";
+    std::string text = margin.substr(number.size()) + number + " | " + text::masked(source) + "\n" + margin + " | ";
+    text.append(colour).append(carets(source, at));
+    return text.append(colour.empty() ? "" : NO_COLOUR) + "\n";
 }
 
 std::string uri_of(std::string_view file) {
     constexpr const char *HEXADECIMAL = "0123456789ABCDEF";
-    std::string uri;
+    std::string uri = file.starts_with('/') ? "file://" : "";
     for (char c : file) {
         auto byte = static_cast<unsigned char>(c);
         bool plain = std::isalnum(byte) != 0 || std::string_view("-._~/").find(c) != std::string_view::npos;
@@ -74,6 +75,22 @@ character_range characters_of(const place &at, std::string_view source) {
         return {at.column, at.length};
     size_t before = characters_in(source, at.column - 1);
     return {before + 1, characters_in(source, at.column - 1 + at.length) - before};
+}
+
+const char *name_of(check::certainty sure) {
+    return sure == check::certainty::certain ? "certain" : "likely";
+}
+
+size_t line_in_file(const place &at) {
+    return static_cast<size_t>(at.file_line != 0 ? at.file_line : at.line);
+}
+
+/* The pieces of the line in front of the place are not known: their bytes count. */
+character_range characters_in_file(const place &at, std::string_view source) {
+    character_range characters = characters_of(at, source);
+    if (at.file_column > at.column)
+        characters.column += at.file_column - at.column;
+    return characters;
 }
 
 std::string_view source_of(const check::note &more, const check::finding &found) {

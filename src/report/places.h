@@ -13,11 +13,14 @@ namespace report {
 /* "file:line:column: ", as much of it as the place has. */
 std::string prefix_of(std::string_view file, const check::place &at);
 
-/* The source's line with its number, and below it a caret for each character of the place; empty for a place without
- * column. */
-std::string excerpt_of(const check::place &at, std::string_view source);
+/* The source's line with its number, and below it a caret for each character of the place, in a colour if there is one
+ * (an escape sequence); empty for a place without column. */
+std::string excerpt_of(const check::place &at, std::string_view source, std::string_view colour = {});
 
-/* A relative or absolute path as a URI reference: bytes that must not stand in one are written as %XX. */
+inline constexpr std::string_view NO_COLOUR = "\033[0m"; /* ends a colour */
+
+/* A path as a URI: an absolute one as file:///..., a relative one as a reference. Bytes that must not stand in one are
+ * written as %XX. */
 std::string uri_of(std::string_view file);
 
 /* UTF-8 characters that begin in the first bytes of a text. What begins one and is cut short counts as one. */
@@ -31,6 +34,14 @@ struct character_range {
 
 /* source: the place's line; if it is empty, bytes count instead of characters. */
 character_range characters_of(const check::place &at, std::string_view source);
+
+/* "certain" or "likely" */
+const char *name_of(check::certainty sure);
+
+/* A place by the lines of the file, which end with a newline each; the compiler counts one that is too long several
+ * times. A place without column has line 0 or more. */
+std::size_t line_in_file(const check::place &at);
+character_range characters_in_file(const check::place &at, std::string_view source);
 
 /* The line that a note is about; empty if it is not known. */
 std::string_view source_of(const check::note &more, const check::finding &found);

@@ -32,10 +32,22 @@ public:
 /* Each writes a document for all sources. */
 std::unique_ptr<writer> json_form(output to);
 std::unique_ptr<writer> sarif_form(output to);
+/* The code quality report of GitLab. */
+std::unique_ptr<writer> gitlab_form(output to);
 
-/* As compilers write it: a line for the finding and each note, and the line of the source with a mark. Nothing of a
+/* Workflow commands of GitHub, one line for each finding. */
+std::unique_ptr<writer> github_form(output to);
+
+struct text_settings {
+    std::size_t shown_max = 0; /* findings; 0: all. Errors are shown before warnings are */
+    bool quiet = false;        /* only errors are shown, without a summary */
+    bool coloured = false;
+};
+
+/* As compilers write it: a line for the finding and each note, and the line of the source with a mark; at the end a
+ * summary. Messages of sources that cannot be read are among them. A list of known names is shown once. Nothing of a
  * source, or of its name, can steer a terminal. */
-std::unique_ptr<writer> text_form(output to);
+std::unique_ptr<writer> text_form(output to, const text_settings &settings);
 
 /* One finding in that form. */
 std::string as_text(const std::string &file, const check::finding &found);

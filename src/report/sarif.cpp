@@ -1,13 +1,16 @@
 /* sarif.cpp: findings as SARIF 2.1.0. */
 
-#include "language/messages.h"
+#include "report/fingerprint.h"
 #include "report/json_text.h"
 #include "report/places.h"
 #include "report/report.h"
+#include "report/rules.h"
 
 #include <nlohmann/json.hpp>
 
+#include <algorithm>
 #include <utility>
+#include <vector>
 
 namespace report {
 
@@ -18,56 +21,97 @@ using check::note;
 using check::place;
 using json = nlohmann::ordered_json;
 
+/* Columns are characters; without the line, bytes have to do. The source as a whole is at its first line, since
+ * consumers want a line. */
 json region_of(const place &at, std::string_view source) {
     json region;
-    region["startLine"] = at.line;
+    region["startLine"] = std::max<size_t>(line_in_file(at), 1);
     if (at.column == 0)
         return region;
-    character_range in_characters = characters_of(at, source);
-    region["startColumn"] = in_characters.column;
-    region["endColumn"] = in_characters.column + in_characters.length;
+    character_range in_file = characters_in_file(at, source);
+    region["startColumn"] = in_file.column;
+    region["endColumn"] = in_file.column + in_file.length;
     return region;
+}
+
+json artifact_of(const std::string &file) {
+    json artifact;
+    artifact["uri"] = uri_of(file);
+    return artifact;
 }
 
 json location_of(const std::string &file, const place &at, std::string_view source) {
     json location;
     json &physical = location["physicalLocation"];
-    physical["artifactLocation"]["uri"] = uri_of(file);
-    if (at.line != 0)
-        physical["region"] = region_of(at, source);
+    physical["artifactLocation"] = artifact_of(file);
+    physical["region"] = region_of(at, source);
     return location;
 }
 
-json result_of(const std::string &file, const finding &found) {
+/* What an edit removes: nothing, a part of a line, or the newline at its end too. */
+json replacement_of(const check::edit &made) {
+    bool ends_line = made.removed.ends_with('\n');
+    json replacement;
+    json &region = replacement["deletedRegion"];
+    region["startLine"] = made.line;
+    region["startColumn"] = made.character;
+    region["endLine"] = made.line + (ends_line ? 1 : 0);
+    region["endColumn"] = ends_line ? 1 : made.character + characters_in(made.removed, made.removed.size());
+    replacement["insertedContent"]["text"] = made.text;
+    return replacement;
+}
+
+json fix_of(const std::string &file, const check::correction &fix) {
+    bool certain = fix.sure == check::certainty::certain;
+    json change;
+    change["artifactLocation"] = artifact_of(file);
+    for (const check::edit &made : fix.edits)
+        change["replacements"].push_back(replacement_of(made));
     json entry;
-    entry["ruleId"] = found.code;
-    entry["level"] = found.error ? "error" : "warning";
-    entry["message"]["text"] = found.text;
-    entry["locations"].push_back(location_of(file, found.at, found.source));
-    for (const note &more : found.notes) {
-        json related = location_of(file, more.at, source_of(more, found));
-        related["message"]["text"] = more.text;
-        entry["relatedLocations"].push_back(std::move(related));
-    }
+    entry["description"]["text"] = certain ? "The only change that is near." : "A change that is likely to be meant.";
+    entry["artifactChanges"].push_back(std::move(change));
+    entry["properties"]["certainty"] = name_of(fix.sure);
     return entry;
 }
 
-json rules() {
+/* Each once, as consumers want it. */
+json related_locations(const std::string &file, const finding &found) {
     json all = json::array();
-    for (const message &known : message_rows) {
-        json rule;
-        rule["id"] = known.code;
-        rule["shortDescription"]["text"] = known.text;
-        all.push_back(std::move(rule));
-    }
-    for (const check::warning &known : check::warnings) {
-        json rule;
-        rule["id"] = known.code;
-        rule["name"] = known.name;
-        rule["shortDescription"]["text"] = known.title;
-        all.push_back(std::move(rule));
+    for (const note &more : found.notes) {
+        json related = location_of(file, more.at, source_of(more, found));
+        related["message"]["text"] = more.text;
+        if (std::find(all.begin(), all.end(), related) == all.end())
+            all.push_back(std::move(related));
     }
     return all;
+}
+
+json result_of(const std::string &file, const finding &found, const fingerprint &print) {
+    json entry;
+    entry["ruleId"] = found.code;
+    entry["ruleIndex"] = rule_index(found.code);
+    entry["level"] = found.error ? "error" : "warning";
+    entry["message"]["text"] = found.text;
+    entry["locations"].push_back(location_of(file, found.at, found.source));
+    if (!found.notes.empty())
+        entry["relatedLocations"] = related_locations(file, found);
+    entry["partialFingerprints"]["primaryLocationLineHash"] = print.text();
+    if (!found.fix.edits.empty())
+        entry["fixes"].push_back(fix_of(file, found.fix));
+    return entry;
+}
+
+json json_of(const rule &known) {
+    json data;
+    data["id"] = known.code;
+    if (!known.name.empty())
+        data["name"] = known.name;
+    data["shortDescription"]["text"] = known.title;
+    data["fullDescription"]["text"] = known.cause;
+    data["help"]["text"] = known.help;
+    data["help"]["markdown"] = known.help;
+    data["defaultConfiguration"]["level"] = known.error ? "error" : "warning";
+    return data;
 }
 
 class sarif_writer : public writer {
@@ -78,12 +122,8 @@ public:
         to.add_text("version", "2.1.0");
         to.open_list("runs");
         to.open_object();
-        json driver;
-        driver["name"] = "cdef check";
-        driver["version"] = CDGEN_VERSION;
-        driver["rules"] = rules();
         to.open_object("tool");
-        to.add_json("driver", json_line(driver));
+        add_driver();
         to.close();
         to.add_text("columnKind", "unicodeCodePoints");
         to.open_list("results");
@@ -92,18 +132,56 @@ public:
         file = name;
     }
     void add(const finding &found) override {
-        to.add_whole([&] { to.add_json({}, json_line(result_of(file, found))); });
+        to.add_whole([&] { to.add_json({}, json_line(result_of(file, found, made.of(file, found)))); });
     }
     void end_source(const check::totals & /* count */) override {}
-    void fail_source(const std::string & /* why */) override {}
+    void fail_source(const std::string &why) override {
+        json notice;
+        notice["level"] = "error";
+        notice["message"]["text"] = why;
+        json location;
+        location["physicalLocation"]["artifactLocation"] = artifact_of(file);
+        notice["locations"].push_back(std::move(location));
+        unreadable.push_back(json_line(notice));
+    }
     void close() override {
-        for (int levels = 4; levels > 0; --levels)
+        to.close();
+        add_invocation();
+        for (int levels = 3; levels > 0; --levels)
             to.close();
     }
 
 private:
+    void add_driver() {
+        to.open_object("driver");
+        to.add_text("name", "cdef check");
+        to.add_text("semanticVersion", CDGEN_VERSION);
+        to.add_text("version", CDGEN_VERSION);
+        to.add_text("informationUri", "man:cdef(1)");
+        to.open_list("rules");
+        for (const rule &known : all_rules())
+            to.add_json({}, json_line(json_of(known)));
+        to.close();
+        to.close();
+    }
+    void add_invocation() {
+        to.open_list("invocations");
+        to.open_object();
+        to.add_truth("executionSuccessful", unreadable.empty());
+        if (!unreadable.empty()) {
+            to.open_list("toolExecutionNotifications");
+            for (const std::string &notice : unreadable)
+                to.add_json({}, notice);
+            to.close();
+        }
+        to.close();
+        to.close();
+    }
+
     json_writer to;
     std::string file;
+    fingerprints made;
+    std::vector<std::string> unreadable; /* a notification for each such source */
 };
 
 } // namespace

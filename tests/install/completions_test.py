@@ -56,7 +56,7 @@ class Offers:
                 self.assertEqual(self.offered(f"cdef {subcommand} -"), options(subcommand))
 
     def test_values_of_options(self):
-        self.assertEqual(set(values("check")), {"--format", "--warn", "--no-warn"})
+        self.assertEqual(set(values("check")), {"--format", "--color", "--warn", "--no-warn"})
         for subcommand in subcommands():
             for option, known in values(subcommand).items():
                 with self.subTest(subcommand, option=option):

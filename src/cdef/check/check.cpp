@@ -17,6 +17,7 @@
 #include <memory>
 #include <string>
 #include <string_view>
+#include <unistd.h>
 #include <vector>
 
 namespace cdef {
@@ -33,6 +34,8 @@ struct check_options {
     bool warnings_count = false; /* as errors do */
     bool fixes = false;
     bool changes_nothing = false; /* only shows what would be fixed */
+    report::text_settings text = {.shown_max = 100};
+    std::string colour = "auto";
 };
 
 std::vector<std::string> warning_names() {
@@ -71,7 +74,13 @@ std::unique_ptr<report::writer> form_of(const check_options &options) {
         return report::json_form(print);
     if (options.form == "sarif")
         return report::sarif_form(print);
-    return report::text_form(show_text);
+    if (options.form == "github")
+        return report::github_form(print);
+    if (options.form == "gitlab")
+        return report::gitlab_form(print);
+    report::text_settings settings = options.text;
+    settings.coloured = wants_colour(options.colour, STDERR_FILENO);
+    return report::text_form(show_text, settings);
 }
 
 check::totals check_source(const std::string &source, const check_options &options, report::writer &to) {
@@ -120,8 +129,14 @@ void add_check(CLI::App &app, int &status) {
     auto options = std::make_shared<check_options>();
     CLI::App *command = app.add_subcommand("check", "Checks sources and reports every mistake, not just the first");
     command->add_option("SOURCE", options->sources, "Source to check; - is standard input")->required();
-    add_forms(*command, options->form, {"text", "json", "sarif"},
-              "Form of the findings: text (on standard error), json or sarif");
+    add_forms(*command, options->form, {"text", "json", "sarif", "github", "gitlab"},
+              "Form of the findings; text is written to standard error");
+    command->add_option("--max", options->text.shown_max, "Show at most N findings as text, errors first; 0: all")
+        ->type_name("N")
+        ->check(CLI::NonNegativeNumber)
+        ->capture_default_str();
+    command->add_flag("-q,--quiet", options->text.quiet, "Show errors only, without a summary, as text");
+    add_colour(*command, options->colour);
     command->add_option("--warn", options->wanted, "Turn on warning NAME, or all")
         ->type_name("NAME")
         ->allow_extra_args(false)

@@ -4,10 +4,12 @@
 #include "cdef/cdef.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/forms.h"
+#include "cdef/support/output.h"
 
 #include <CLI/CLI.hpp>
 
 #include <memory>
+#include <unistd.h>
 
 namespace cdef {
 
@@ -16,6 +18,7 @@ namespace {
 struct dump_options {
     std::string file;
     std::string form;
+    std::string colour;
     bool with_offsets = false;
 };
 
@@ -29,7 +32,7 @@ void run(const dump_options &options) {
     if (options.form == "json")
         dump::show_json(in, found, options.with_offsets);
     else
-        dump::show_listing(in, found, options.with_offsets);
+        dump::show_listing(in, found, options.with_offsets, wants_colour(options.colour, STDOUT_FILENO));
 }
 
 } // namespace
@@ -40,6 +43,7 @@ void add_dump(CLI::App &app, int &status) {
     command->add_option("FILE", options->file, "Database to show; - is standard input")->required();
     add_forms(*command, options->form, {"text", "json", "hex"},
               "Form of what is shown: text, json, or hex: every byte and what it is, even of a damaged file");
+    add_colour(*command, options->colour);
     command->add_flag("--offsets", options->with_offsets, "Also show the offset of each record and list");
     command->footer("Exit status: 0 if the database is shown, 2 if it cannot be shown.");
     command->callback([options, &status] {

@@ -98,7 +98,7 @@ public:
 };
 
 /* Each shows a whole database on standard output; throws failure if that fails. */
-void show_listing(const input &in, const readability &found, bool with_offsets);
+void show_listing(const input &in, const readability &found, bool with_offsets, bool coloured);
 void show_json(const input &in, const readability &found, bool with_offsets);
 void show_hex(const input &in);
 

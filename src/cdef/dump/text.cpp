@@ -109,8 +109,8 @@ std::string as_text(const fact &f) {
     return std::visit([](const auto &some) { return text_of(some); }, f);
 }
 
-void show_listing(const input &in, const readability &found, bool with_offsets) {
-    listing to(wants_colour());
+void show_listing(const input &in, const readability &found, bool with_offsets, bool coloured) {
+    listing to(coloured);
     walk(in.db, found, to, with_offsets);
     to.out.flush();
 }

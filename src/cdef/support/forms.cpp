@@ -24,4 +24,10 @@ void add_forms(CLI::App &command, std::string &form, const std::vector<std::stri
     }
 }
 
+void add_colour(CLI::App &command, std::string &colour) {
+    colour = "auto";
+    command.add_option("--color", colour, "Whether text has colours; auto: on a terminal")
+        ->check(CLI::IsMember({"auto", "always", "never"}));
+}
+
 } // namespace cdef

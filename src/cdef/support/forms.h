@@ -15,6 +15,9 @@ namespace cdef {
  * that form, which are short for it. The chosen form is stored in `form`, which must stay as long as the command. */
 void add_forms(CLI::App &command, std::string &form, const std::vector<std::string> &forms, const std::string &help);
 
+/* Adds --color, which is stored in `colour`; wants_colour() says what it means. */
+void add_colour(CLI::App &command, std::string &colour);
+
 } // namespace cdef
 
 #endif

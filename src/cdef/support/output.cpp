@@ -17,9 +17,14 @@ void print(std::string_view text) {
         throw failure(std::string("standard output: ") + std::strerror(errno));
 }
 
-bool wants_colour() {
+bool wants_colour(std::string_view when, int descriptor) {
+    if (when != "auto")
+        return when == "always";
     const char *no_colour = std::getenv("NO_COLOR");
-    return (no_colour == nullptr || *no_colour == '\0') && isatty(STDOUT_FILENO) != 0;
+    const char *terminal = std::getenv("TERM");
+    bool unwanted = no_colour != nullptr && *no_colour != '\0';
+    bool is_dumb = terminal != nullptr && std::string_view(terminal) == "dumb";
+    return !unwanted && !is_dumb && isatty(descriptor) != 0;
 }
 
 } // namespace cdef

@@ -11,8 +11,9 @@ namespace cdef {
 /* Writes to standard output; throws failure if that fails. */
 void print(std::string_view text);
 
-/* True if terminal colours are wanted: standard output is a terminal, and NO_COLOR is not set or empty. */
-bool wants_colour();
+/* True if colours are wanted on a descriptor. when: "always", "never", or "auto": it is a terminal, which TERM does not
+ * call dumb, and NO_COLOR is not set or empty. */
+bool wants_colour(std::string_view when, int descriptor);
 
 /* Text on its way to standard output, so that a long listing need not be in memory as a whole. */
 class output {

@@ -6,7 +6,7 @@ A case is NAME.cdefsrc with NAME.expect, whose keys and blocks are
     status:    exit status (default 0)
     stdin:     yes: the source is also checked as standard input
     stdout:    what is printed there, and
-    stderr:    there
+    stderr:    there, without the summary that follows findings
 """
 
 import shlex
@@ -17,6 +17,7 @@ import pytest
 from compare import same
 from expectation import Expectation
 from programs import PROGRAMS, PROJECT, TESTS
+from summaries import with_summary
 
 CASES = TESTS / "cdef/check"
 
@@ -38,7 +39,7 @@ def test_case(name):
     """What is said of a source, by its name and as standard input."""
     said = expected_of(CASES / f"{name}.expect")
     args, source = shlex.split(said.get("args")), CASES / f"{name}.cdefsrc"
-    expected = (int(said.get("status", "0")), said.get("stdout"), said.get("stderr"))
+    expected = (int(said.get("status", "0")), said.get("stdout"), with_summary(said.get("stderr")))
     same(run(args, source), expected, "status, standard output, standard error")
     if said.has("stdin"):
         named = tuple(each.replace(f"{source.name}:", "-:") if isinstance(each, str) else each for each in expected)
@@ -47,5 +48,5 @@ def test_case(name):
 
 def test_document():
     """docs/check.md shows what is said of a source; unit tests compare docs/messages.md with the tables."""
-    example = expected_of(CASES / "disk.expect").get("stderr")
+    example = with_summary(expected_of(CASES / "disk.expect").get("stderr"))
     assert f"```\n{example}```\n" in (PROJECT / "docs/check.md").read_text()

@@ -43,11 +43,12 @@ class Logs(unittest.TestCase):
     def test_nothing_found(self):
         self.assertEqual(self.sarif("sound.cdefsrc"), [])
 
-    def test_without_a_region(self):
+    def test_of_the_source_as_a_whole(self):
+        """Consumers want a line."""
         results = self.sarif("empty.cdefsrc")
         self.assertEqual([result["ruleId"] for result in results], ["S301", "S302"])
         for result in results:
-            self.assertNotIn("region", result["locations"][0]["physicalLocation"])
+            self.assertEqual(result["locations"][0]["physicalLocation"]["region"], {"startLine": 1})
 
     def test_without_a_column(self):
         region = self.sarif("keys.cdefsrc")[1]["locations"][0]["physicalLocation"]["region"]
@@ -63,7 +64,7 @@ class Logs(unittest.TestCase):
             place = result["locations"][0]["physicalLocation"]
             said = (result["ruleId"], result["level"], result["message"]["text"], place["artifactLocation"]["uri"])
             self.assertEqual(said, (one["code"], one["severity"], one["message"], file))
-            self.assertEqual(place.get("region", {}).get("startLine"), one["line"])
+            self.assertEqual(place["region"]["startLine"], one.get("physical_line", one["line"] or 1))
             notes = [note["message"]["text"] for note in result.get("relatedLocations", [])]
             self.assertEqual(notes, [note["message"] for note in one["notes"]])
 

@@ -16,6 +16,7 @@ import unittest
 
 from expectation import Expectation
 from programs import PROGRAMS, PROJECT, TESTS
+from summaries import with_summary
 
 EDITORS = PROJECT / "editors"
 CASES = TESTS / "cdef/check"
@@ -44,9 +45,9 @@ class Sources(unittest.TestCase):
     """One or many, and which of them cannot be read."""
 
     def test_the_worst_decides(self):
-        self.assertEqual(check(RIGHT, ODD), (0, "", expected(ODD)))
-        self.assertEqual(check(ODD, WRONG, RIGHT), (1, "", expected(ODD) + expected(WRONG)))
-        self.assertEqual(check("--werror", RIGHT, ODD), (1, "", expected(ODD)))
+        self.assertEqual(check(RIGHT, ODD), (0, "", with_summary(expected(ODD), 2)))
+        self.assertEqual(check(ODD, WRONG, RIGHT), (1, "", with_summary(expected(ODD) + expected(WRONG), 3)))
+        self.assertEqual(check("--werror", RIGHT, ODD), (1, "", with_summary(expected(ODD), 2)))
 
     def test_missing(self):
         self.assertEqual(check("missing"), (2, "", MISSING))
@@ -59,11 +60,11 @@ class Sources(unittest.TestCase):
         with tempfile.TemporaryDirectory() as directory:
             source = pathlib.Path(directory) / "\x1b[31m.cdefsrc"
             source.write_bytes((CASES / WRONG).read_bytes())
-            self.assertEqual(check(source), (1, "", expected(WRONG, f"{directory}/?[31m.cdefsrc")))
+            self.assertEqual(check(source), (1, "", with_summary(expected(WRONG, f"{directory}/?[31m.cdefsrc"))))
 
     def test_the_others_are_shown_where_they_stand(self):
         text = expected(ODD) + MISSING + expected(WRONG) + DIRECTORY
-        self.assertEqual(check(ODD, "missing", WRONG, "."), (2, "", text))
+        self.assertEqual(check(ODD, "missing", WRONG, "."), (2, "", with_summary(text, 4)))
 
     def test_the_others_are_shown_to_programs(self):
         status, text, messages = check("--format", "json", WRONG, "missing", RIGHT)
@@ -137,7 +138,7 @@ class TooMany(unittest.TestCase):
         with tempfile.TemporaryDirectory() as directory:
             source, text = pathlib.Path(directory) / "too-many", head + body + tail
             source.write_text(text)
-            self.assertEqual(check(source), (1, "", f"{source}:{text.count(chr(10))}: {message}"))
+            self.assertEqual(check(source), (1, "", with_summary(f"{source}:{text.count(chr(10))}: {message}")))
             source.write_text(text.replace(named.format(100), "").replace("=V100\n", "=V99\n"))
             self.assertEqual(check(source), (0, "", ""))
 
@@ -150,7 +151,7 @@ class TooMany(unittest.TestCase):
             text = head + 65536 * ("PersistentClassAttribute\n" + attribute) + "ClassToManagerMapping\n" + tail
             source.write_text(text)
             expected_line = f"{source}:{text.count(chr(10))}: {message}"
-            self.assertEqual(check("--no-warn", "all", source), (1, "", expected_line))
+            self.assertEqual(check("--no-warn", "all", source), (1, "", with_summary(expected_line)))
 
 
 class Surroundings(unittest.TestCase):
@@ -242,21 +243,21 @@ class StandardInput(unittest.TestCase):
 
     def test_file(self):
         with open(CASES / WRONG, "rb") as file:
-            self.assertEqual(check("-", stdin=file), (1, "", expected(WRONG, "-")))
+            self.assertEqual(check("-", stdin=file), (1, "", with_summary(expected(WRONG, "-"))))
 
     def test_file_that_has_been_read_in_part(self):
         with tempfile.TemporaryFile() as file:
             file.write(b"Nonsense\n" + (CASES / WRONG).read_bytes())
             file.flush()
             os.lseek(file.fileno(), len(b"Nonsense\n"), os.SEEK_SET)
-            self.assertEqual(check("-", stdin=file), (1, "", expected(WRONG, "-")))
+            self.assertEqual(check("-", stdin=file), (1, "", with_summary(expected(WRONG, "-"))))
 
     def test_socket(self):
         ours, theirs = socket.socketpair()
         with ours, theirs:
             ours.sendall((CASES / WRONG).read_bytes())
             ours.shutdown(socket.SHUT_WR)
-            self.assertEqual(check("-", stdin=theirs), (1, "", expected(WRONG, "-")))
+            self.assertEqual(check("-", stdin=theirs), (1, "", with_summary(expected(WRONG, "-"))))
 
     def test_directory(self):
         directory = os.open(CASES, os.O_RDONLY)

@@ -40,6 +40,7 @@ TEST(Uri, EscapesWhatMustNotBeInIt) {
     EXPECT_EQ(report::uri_of("dir/a-b_c.d~1"), "dir/a-b_c.d~1");
     EXPECT_EQ(report::uri_of("a b%\xc3\xa4"), "a%20b%25%C3%A4");
     EXPECT_EQ(report::uri_of("a:b?#[]"), "a%3Ab%3F%23%5B%5D");
+    EXPECT_EQ(report::uri_of("/a b/c"), "file:///a%20b/c");
 }
 
 TEST(Characters, AreThoseThatBeginInTheBytes) {
@@ -104,7 +105,8 @@ TEST(Json, HasPlacesInBytesAndInCharacters) {
           "character_column": 2,
           "character_length": 1,
           "source": "\u00e4b",
-          "notes": []
+          "notes": [],
+          "fix": null
         }
       ],
       "errors": 2,

@@ -1,0 +1,40 @@
+/* rules.cpp: what is known of each code. */
+
+#include "report/rules.h"
+
+#include "check/check.h"
+#include "language/messages.h"
+
+#include <algorithm>
+
+namespace report {
+
+namespace {
+
+std::string help_of(std::string_view cause, std::string_view cure) {
+    return std::string(cause).append(cure.empty() ? "" : " ").append(cure);
+}
+
+std::vector<rule> make_rules() {
+    std::vector<rule> all;
+    for (const message &known : message_rows)
+        all.push_back({known.code, {}, known.text, known.cause, help_of(known.cause, known.cure), true});
+    for (const check::warning &known : check::warnings)
+        all.push_back({known.code, known.name, known.title, known.cause, help_of(known.cause, known.cure), false});
+    return all;
+}
+
+} // namespace
+
+const std::vector<rule> &all_rules() {
+    static const std::vector<rule> all = make_rules();
+    return all;
+}
+
+std::size_t rule_index(std::string_view code) {
+    const std::vector<rule> &all = all_rules();
+    auto found = std::find_if(all.begin(), all.end(), [code](const rule &known) { return known.code == code; });
+    return static_cast<std::size_t>(found - all.begin());
+}
+
+} // namespace report

@@ -1,0 +1,29 @@
+/* rules.h: what is known of each code, of errors and of warnings alike. */
+#ifndef CDGEN_REPORT_RULES_H
+#define CDGEN_REPORT_RULES_H
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace report {
+
+struct rule {
+    std::string_view code;
+    std::string_view name; /* of a warning; empty for an error */
+    std::string_view title;
+    std::string_view cause;
+    std::string help; /* the cause and the cure; `names of the language` are in backquotes */
+    bool error;
+};
+
+/* The errors, then the warnings. */
+const std::vector<rule> &all_rules();
+
+/* The position of a code in all_rules(). */
+std::size_t rule_index(std::string_view code);
+
+} // namespace report
+
+#endif

@@ -1,0 +1,55 @@
+"""Test that `cdef check` takes at most 8 times the source and 16 MB, however much is wrong, in every form.
+
+WRONG_LINES is how many lines are wrong: 300,000 where nothing is said, 10,000,000 in script/proof. The limit is one of
+the address space, so that nothing depends on what else the machine does.
+"""
+
+import os
+import resource
+import subprocess
+
+import pytest
+
+from compare import same
+from programs import PROGRAMS
+
+LINES = int(os.environ.get("WRONG_LINES", "300000"))
+MEGABYTES = 1 << 20
+
+SOURCES = {
+    "unknown-headers": ("", "x\n"),
+    "different-headers": ("", "{:x}\n"),
+    "lines-without-equals": ("ControlDefinition\n", " x\n"),
+    "unknown-attributes": ("ControlDefinition\n", " x=1\n"),
+    "misspelt-attributes": ("ControlDefinition\n", " FileVersoin=1\n"),
+    "elements-of-nothing": ("", "PAttrSDDefinition\n"),
+    "maps": ("", "ClassToManagerMapping\n"),
+}
+
+
+FORMS = ("text", "json", "sarif", "github", "gitlab")
+CASES = [("different-headers", form) for form in FORMS] + [("unknown-attributes", form) for form in FORMS[1:3]]
+CASES += [(name, "text") for name in SOURCES if name != "different-headers"]
+
+
+@pytest.mark.slow(30)
+@pytest.mark.parametrize(("name", "form"), CASES)
+def test_bound(directory, name, form):
+    """Every finding is written, or counted."""
+    if PROGRAMS.sanitizers or not PROGRAMS.is_on("CDGEN_STATIC"):
+        pytest.skip("a sanitizer or a shared library takes address space of its own")
+    head, line = SOURCES[name]
+    source = directory / "wrong"
+    with source.open("w") as file:
+        file.write(head)
+        file.writelines(line.format(number) for number in range(LINES))
+    bound = 8 * source.stat().st_size + 16 * MEGABYTES
+    command = [PROGRAMS.cdef, "check", "--format", form, source]
+    with (directory / "out").open("wb") as out, (directory / "err").open("wb") as err:
+        result = subprocess.run(command, stdout=out, stderr=err, timeout=3600,
+                                preexec_fn=lambda: resource.setrlimit(resource.RLIMIT_AS, (bound, bound)))
+    messages = (directory / "err").read_bytes()
+    same((result.returncode, b"memory" in messages), (1, False), f"status, in {bound} bytes")
+    if form == "text":
+        same(messages.count(b": error: "), 100, "errors shown")
+        assert int(messages.splitlines()[-1].split()[0]) >= LINES

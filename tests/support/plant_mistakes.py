@@ -449,9 +449,117 @@ class Planter:
         return self.wrong_word(("Locator",))
 
 
+    # -- what compiles, but loses something --
+
+    def value_of(self, one, name):
+        """The plain value that a stanza gives an attribute, or None."""
+        found = [parts(self.lines[at]) for at in one.positions(name)]
+        return found[0][2] if found and found[0] else None
+
+    def insert(self, at, line):
+        """Adds a line."""
+        self.lines.insert(at, line)
+        return [at]
+
+    def invalid_default(self):
+        """A default is not the one valid value."""
+        fit = [(one, at) for one, at in self.lines_with("DefaultValue", "InitialValue") if self.numeric_type(one)
+               and one.kind != "PersistentClassAttribute" and len(one.positions("DefaultValue")) < 2
+               and not one.positions("ValidValue") + one.positions("ValidStateValue")
+               and re.fullmatch("[1-9][0-9]{0,8}", parts(self.lines[at])[2])]
+        chosen = self.choose(fit)
+        if chosen is None:
+            return None
+        one, at = chosen
+        name = "ValidValue" if one.kind.startswith("P") else "ValidStateValue"
+        return [at, *self.insert(at + 1, f"\t{name}={int(parts(self.lines[at])[2]) + 1}")]
+
+    def invalid_own_default(self):
+        """An attribute without a default has valid values, but not the default of its type."""
+        one = self.choose([one for one in self.stanzas if one.kind == "PersistentResourceAttribute" and self.numeric_type(one)
+                           and not one.positions("DefaultValue") + one.positions("ValidValue") + one.positions("Properties")])
+        if one is None:
+            return None
+        return [one.header, *self.insert(one.attributes[-1][0] + 1, "\tValidValue=1,9")]
+
+    def repeated_varieties(self):
+        """Varieties are given twice."""
+        chosen = self.choose(self.lines_with("VarietyRange"))
+        return chosen and [chosen[1], *self.insert(chosen[1] + 1, self.lines[chosen[1]])]
+
+    def same_in_both(self, attribute, change=str):
+        """A dynamic attribute has a value of a persistent one. The one that comes later may be reported."""
+        level = self.chooser.choice(("Resource", "Class"))
+        lines = self.lines_with(attribute)
+        given = self.choose([at for one, at in lines if one.kind == f"Persistent{level}Attribute"])
+        chosen = self.choose([at for one, at in lines if one.kind == f"Dynamic{level}Attribute"])
+        if given is None or chosen is None:
+            return None
+        changed = self.replace(chosen, value=change(parts(self.lines[given])[2]))
+        return changed and [chosen, given]
+
+    def name_of_other_kind(self):
+        """A dynamic attribute has the name of a persistent one."""
+        return self.same_in_both("Name")
+
+    def name_in_other_case(self):
+        """A dynamic attribute has the name of a persistent one, but for case."""
+        letters = LETTERS + LETTERS.upper()
+        return self.same_in_both("Name", lambda name: "".join(c.swapcase() if c in letters else c for c in name))
+
+    def id_of_other_kind(self):
+        """A dynamic attribute has the Id of a persistent one."""
+        return self.same_in_both("Id")
+
+    def blank_in_front(self):
+        """A blank is in front of a name."""
+        chosen = self.choose([(one, at) for one, at in self.lines_with("Name", "ElementName", "MessageCatalog", "Alias")])
+        return chosen and self.replace(chosen[1], value=" " + parts(self.lines[chosen[1]])[2])
+
+    def lone_parenthesis(self):
+        """An expression has a parenthesis that is not closed."""
+        fit = [(one, at) for one, at in self.lines_with("Expression", "ReArmExpression")
+               if not set(parts(self.lines[at])[2]) & set("()\"'\\")]
+        chosen = self.choose(fit)
+        return chosen and self.replace(chosen[1], value="(" + parts(self.lines[chosen[1]])[2])
+
+    def class_bit(self):
+        """The Id of an attribute in a variable class has the bit of class attributes."""
+        fit = [(one, at) for one, at in self.lines_with("Id") if one.kind.startswith("Dynamic") and one.positions("VariableClass")]
+        chosen = self.choose(fit)
+        return chosen and self.replace(chosen[1], value=str(32768 + self.chooser.randrange(32768)))
+
+    def large_locator(self):
+        """The Id of the attribute that is the Locator has more than 16 bits."""
+        names = [parts(self.lines[at])[2] for _, at in self.lines_with("Locator")]
+        fit = [(one, at) for one, at in self.lines_with("Id") if one.kind == "PersistentResourceAttribute"
+               and self.value_of(one, "Name") in names]
+        return self.replace(fit[0][1], value=str(self.chooser.randint(65536, 10**6))) if fit else None
+
+    def elements_of_other_kind(self):
+        """The only element of an attribute is of the other kind."""
+        kinds = {"PAttrSDDefinition": "DAttrSDDefinition", "DAttrSDDefinition": "PAttrSDDefinition"}
+        single = [one for before, one, after in zip(self.stanzas, self.stanzas[1:], self.stanzas[2:])
+                  if one.kind in kinds and one.kind not in (before.kind, after.kind) and after.kind not in kinds]
+        one = self.choose(single)
+        return one and self.put(one.header, kinds[one.kind])
+
+    def elements_without_stanza_between(self):
+        """Elements of the class directly follow those of an attribute."""
+        last = [after for one, after in zip(self.stanzas, self.stanzas[1:])
+                if one.kind in ("PAttrSDDefinition", "DAttrSDDefinition") and not after.is_element]
+        one = self.choose(last)
+        if one is None:
+            return None
+        self.lines[one.header:one.header] = ["ResetSDDefinition", "\tElementName=E", "\tDescription=1", "\tDisplayName=2",
+                                             "\tElementIndex=0", "\tDataType=Int32"]
+        return [one.header]
+
+
 KINDS = tuple(name for name, member in vars(Planter).items()
               if callable(member) and name not in
-              ("__init__", "lines_with", "choose", "replace", "put", "drop", "move", "move_down", "new_value", "wrong_word", "numeric_type"))
+              ("__init__", "lines_with", "choose", "replace", "put", "drop", "move", "move_down", "new_value", "wrong_word", "numeric_type",
+               "value_of", "insert", "same_in_both"))
 
 
 def plant(chooser, text, kind):

@@ -1,16 +1,22 @@
 # bash completion for cdef; what it understands is taken from its own help
 
 _cdef() {
-    local word subcommand='' values=''
+    local word subcommand='' values='' option=$3 current=$2 is=''
     for word in "${COMP_WORDS[@]:1:COMP_CWORD-1}"; do
         [[ $word != -* ]] && subcommand=$word && break
     done
-    if [[ $3 == --* ]]; then
+    # A value after "=" may be optional; the shell takes "=" for a word.
+    if [[ $3 == = ]]; then
+        option=${COMP_WORDS[COMP_CWORD-2]} is='\[='
+    elif [[ $2 == = ]]; then
+        current='' is='\[='
+    fi
+    if [[ $option == --* ]]; then
         values=$("$1" ${subcommand:+"$subcommand"} --help 2>/dev/null |
-            sed -nE "s/^  $3 [A-Z]+:\{([^}]*)\}.*/\1/p" | tr , ' ')
+            sed -nE "s/^  $option $is[A-Z]+:\{([^}]*)\}.*/\1/p" | tr , ' ')
     fi
     if [[ $values ]]; then
-        mapfile -t COMPREPLY < <(compgen -W "$values" -- "$2")
+        mapfile -t COMPREPLY < <(compgen -W "$values" -- "$current")
     elif [[ $2 == -* ]]; then
         local options
         options=$("$1" ${subcommand:+"$subcommand"} --help 2>/dev/null | sed -n 's/^  \(-[^ ]*\).*/\1/p' | tr , ' ')

@@ -19,9 +19,17 @@ function __cdef_values
     and cdef (__cdef_subcommand) --help 2>/dev/null | sed -nE "s/^  $option [A-Z]+:\{([^}]*)\}.*/\1/p" | string split ,
 end
 
+# Values that are optional: --option=value.
+function __cdef_joined_values
+    set -l option (string split -f 1 = -- (commandline -ct))
+    cdef (__cdef_subcommand) --help 2>/dev/null | sed -nE "s/^  $option \[=[A-Z]+:\{([^}]*)\}.*/\1/p" | string split , |
+        string replace -r '^' -- "$option="
+end
+
 complete -c cdef -f
+complete -c cdef -n 'string match --quiet -- "--*=*" (commandline -ct)' -a '(__cdef_joined_values)'
 complete -c cdef -n 'test -n "$(__cdef_values)"' -a '(__cdef_values)'
 complete -c cdef -n 'test -z "$(__cdef_subcommand)"' -a '(__cdef_subcommands)'
-complete -c cdef -k -n 'test -n "$(__cdef_subcommand)"; and test "$(__cdef_subcommand)" != explain; and test -z "$(__cdef_values)"' -a '(__fish_complete_suffix .cdef)'
+complete -c cdef -k -n 'test -n "$(__cdef_subcommand)"; and test "$(__cdef_subcommand)" != explain; and test -z "$(__cdef_values)"; and not string match --quiet -- "--*=*" (commandline -ct)' -a '(__fish_complete_suffix .cdef)'
 complete -c cdef -k -n 'test "$(__cdef_subcommand)" = explain; and test -z "$(__cdef_values)"' -a '(cdef explain 2>/dev/null | sed -E "s/ +/\t/")'
 complete -c cdef -n 'string match --quiet -- "-*" (commandline -ct)' -a '(__cdef_options)'

@@ -81,8 +81,8 @@ std::string quoted(std::string_view bytes) {
     return '"' + escaped(bytes, "\"\\") + '"';
 }
 
-std::string quoted_ascii(std::string_view bytes) {
-    std::string shown = "'";
+std::string escaped_ascii(std::string_view bytes) {
+    std::string shown;
     for (char c : bytes) {
         if (c == '\'' || c == '\\')
             shown += {'\\', c};
@@ -91,7 +91,11 @@ std::string quoted_ascii(std::string_view bytes) {
         else
             append_byte(shown, c);
     }
-    return shown + "'";
+    return shown;
+}
+
+std::string quoted_ascii(std::string_view bytes) {
+    return "'" + escaped_ascii(bytes) + "'";
 }
 
 std::string masked(std::string_view bytes) {

@@ -18,7 +18,10 @@ std::string escaped(std::string_view bytes);
 /* The same in double quotes, with quotes and backslashes escaped too. */
 std::string quoted(std::string_view bytes);
 
-/* In single quotes; everything that is not printable ASCII is written as \xNN. */
+/* Single quotes and backslashes get a backslash; everything that is not printable ASCII is written as \xNN. */
+std::string escaped_ascii(std::string_view bytes);
+
+/* The same in single quotes. */
 std::string quoted_ascii(std::string_view bytes);
 
 /* The text with a '?' for each character that is not printable, except tabs: as many columns as the text has. */

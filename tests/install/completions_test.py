@@ -65,6 +65,11 @@ class Offers:
     def test_codes_for_explain(self):
         self.assertEqual(self.offered("cdef explain S50"), {f"S50{number}" for number in range(1, 10)})
 
+    def test_values_that_are_optional(self):
+        for typed, known in (("", {"readers", "clients", "stored"}), ("c", {"clients"})):
+            with self.subTest(typed):
+                self.assertEqual(self.offered_after("cdef diff", "--compat", typed), known)
+
     def test_databases_for_a_subcommand(self):
         offered = self.offered("cdef verify ")
         self.assertLessEqual({"Disk.cdef", "Tape Drive.cdef"}, offered)
@@ -82,6 +87,10 @@ class Bash(Offers, Shell):
             printf '%s\\n' "${{COMPREPLY[@]}}"'''
         return list(filter(None, self.shell("bash", "--norc", "-c", script).splitlines()))
 
+    def offered_after(self, line, option, typed):
+        """The shell takes "=" for a word of its own."""
+        return self.offered(f"{line} {option} = {typed}" if typed else f"{line} {option} =")
+
     def test_bash_completion_finds_them(self):
         script = ("source /usr/share/bash-completion/bash_completion && for name in cdgen cdef; do "
                   "__load_completion $name && complete -p $name; done")
@@ -95,6 +104,9 @@ class Fish(Offers, Shell):
         name = line.split()[0]
         said = self.shell("fish", "--no-config", "-c", f"source '{place}/{name}.fish'; complete -C '{line}'")
         return [offer.split("\t")[0].replace("\\ ", " ") for offer in said.splitlines()]
+
+    def offered_after(self, line, option, typed):
+        return {offer.removeprefix(f"{option}=") for offer in self.offered(f"{line} {option}={typed}")}
 
 
 class Zsh(Shell):

@@ -1,4 +1,4 @@
-/* diff.cpp: what differs between two databases, and whether readers of the one can read the other. */
+/* diff.cpp: what differs between two databases, and for whom it matters. */
 
 #include "cdef/cdef.h"
 #include "cdef/support/failure.h"
@@ -6,14 +6,13 @@
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
 #include "compare/compare.h"
-#include "compare/text.h"
+#include "compare/writer.h"
 #include "report/json_writer.h"
 
 #include <CLI/CLI.hpp>
 
 #include <algorithm>
 #include <memory>
-#include <span>
 
 namespace cdef {
 
@@ -27,113 +26,305 @@ using compare::node_kind;
 struct diff_options {
     std::string before;
     std::string after;
-    bool compat = false; /* only what breaks readers */
+    std::string compat; /* the level up to which breaches are shown, and nothing else; empty: everything is shown */
     std::string form;
 };
 
+/* ---- Output ---------------------------------------------------------------------------------------------------- */
+
+/* Text on its way to standard output. The beginning is kept back until it is certain that the comparison succeeds: half
+ * a comparison would mislead. */
+class held_output {
+public:
+    void take(std::string_view piece) {
+        if (is_open) {
+            out.text += piece;
+            return out.flush_if_full();
+        }
+        if (!is_too_long && out.text.size() + piece.size() <= KEPT)
+            out.text += piece;
+        else
+            is_too_long = true;
+    }
+    /* Whether more was to be written than is kept. */
+    bool has_lost() const {
+        return is_too_long;
+    }
+    /* Forgets what was kept; from now on everything is written. */
+    void begin_again() {
+        out.text.clear();
+        is_open = true;
+    }
+    void finish() {
+        out.flush();
+    }
+
+private:
+    static constexpr std::size_t KEPT = 1 << 20; /* bytes */
+
+    output out;
+    bool is_open = false;
+    bool is_too_long = false;
+};
+
+/* ---- Forms ----------------------------------------------------------------------------------------------------- */
+
 const char *name_of(change what) {
-    return what == change::removed ? "removed" : what == change::added ? "added" : "changed";
+    switch (what) {
+    case change::REMOVED:
+        return "removed";
+    case change::ADDED:
+        return "added";
+    case change::RENAMED:
+        return "renamed";
+    case change::CHANGED:
+        break;
+    }
+    return "changed";
 }
 
 char sign_of(change what) {
-    return what == change::removed ? '-' : what == change::added ? '+' : '~';
+    return what == change::REMOVED ? '-' : what == change::ADDED ? '+' : '~';
 }
 
-bool has_one_class(const node &database) {
-    return std::count_if(database.parts.begin(), database.parts.end(),
-                         [](const node &n) { return n.kind == node_kind::resource_class; }) == 1;
+/* Rules that a difference breaks, as far as somebody asked for them. */
+std::vector<const compare::breach_rule *> rules_broken(const difference &d, compare::level up_to) {
+    std::vector<const compare::breach_rule *> rules;
+    for (compare::breach b : d.broken)
+        if (const compare::breach_rule &rule = compare::rule_of(b); rule.broken_for <= up_to)
+            rules.push_back(&rule);
+    return rules;
 }
 
-/* The part of a path that a line shows: neither the database nor, if there is just one, the class. */
-std::vector<const node *> shown_path(const difference &d, bool one_class) {
-    std::size_t skipped = d.path.size() == 1                                                               ? 0
-                          : d.path.size() > 2 && one_class && d.path[1]->kind == node_kind::resource_class ? 2
-                                                                                                           : 1;
-    return {d.path.begin() + static_cast<std::ptrdiff_t>(skipped), d.path.end()};
-}
+/* Differences as lines of text. */
+class lines {
+public:
+    lines(held_output &to, std::size_t size, bool has_one_class)
+        : out(to), writer(size, [&to](std::string_view piece) { to.take(piece); }), one_class(has_one_class) {}
 
-std::string line_of(const difference &d, bool one_class, bool with_reason) {
-    std::string line = {sign_of(d.what), ' '};
-    bool first = true;
-    for (const node *n : shown_path(d, one_class)) {
-        line += std::exchange(first, false) ? "" : ", ";
-        line.append(n->label()).append(n->name.empty() ? "" : " ").append(n->name);
+    void begin() {}
+    void end() {}
+
+    void add(const difference &d, const std::vector<const compare::breach_rule *> &reasons) {
+        out.take(std::string{sign_of(d.what), ' '});
+        write_path(d);
+        if (d.what == change::RENAMED) {
+            writer.write(": renamed to ");
+            writer.write_name(*d.renamed_to);
+        }
+        if (d.what == change::CHANGED)
+            write_change(d);
+        for (const compare::breach_rule *rule : reasons)
+            out.take(std::string(rule == reasons.front() ? " (" : "; ").append(rule->reason));
+        out.take(reasons.empty() ? "\n" : ")\n");
     }
-    if (d.what == change::changed)
-        line += ": " + std::string(d.before->what->label()) + " " + d.before->text + " -> " + d.after->text;
-    if (with_reason)
-        line += " (" + std::string(breach(d)) + ")";
-    return line + "\n";
-}
 
-/* Adds a difference to a list. */
-void add_difference(report::json_writer &to, const difference &d) {
-    to.open_object();
-    to.add_text("change", name_of(d.what));
-    to.open_list("path");
-    for (const node *n : std::span(d.path).subspan(1)) { /* the first is the database */
+private:
+    /* Neither the database nor, if there is just one, the class. */
+    void write_path(const difference &d) {
+        bool in_only_class = d.path.size() > 2 && one_class && d.path[1]->kind == node_kind::resource_class;
+        std::size_t first = d.path.size() == 1 ? 0 : in_only_class ? 2 : 1;
+        for (std::size_t i = first; i < d.path.size(); ++i) {
+            out.take(i == first ? "" : ", ");
+            out.take(d.path[i]->label());
+            out.take(has_name(*d.path[i]) ? " " : "");
+            writer.write_name(*d.path[i]);
+        }
+    }
+
+    void write_change(const difference &d) {
+        out.take(": ");
+        out.take(d.before->what->label());
+        out.take(" ");
+        writer.write_fact(*d.before);
+        out.take(" -> ");
+        writer.write_fact(*d.after);
+    }
+
+    held_output &out;
+    compare::writer writer;
+    bool one_class;
+};
+
+/* Differences as JSON. */
+class document {
+public:
+    document(held_output &out, std::size_t size, const diff_options &compared)
+        : to([&out](std::string_view piece) { out.take(piece); }),
+          writer(size, [this](std::string_view piece) { text += piece; }), options(compared) {}
+    document(const document &) = delete;
+    document &operator=(const document &) = delete;
+
+    void begin() {
         to.open_object();
-        to.add_text("kind", n->label());
-        to.add_text("name", n->name);
+        to.add_schema("cdef-diff.schema.json", 1);
+        to.add_text("before", options.before);
+        to.add_text("after", options.after);
+        to.open_list("differences");
+    }
+    void end() {
+        to.close();
         to.close();
     }
-    to.close();
-    if (d.what == change::changed) {
-        to.add_text("field", d.before->what->field);
-        to.add_text("before", d.before->text);
-        to.add_text("after", d.after->text);
+
+    void add(const difference &d, const std::vector<const compare::breach_rule *> &reasons) {
+        to.open_object();
+        to.add_text("change", name_of(d.what));
+        add_path(d);
+        if (d.what == change::RENAMED)
+            add_name("name", *d.renamed_to);
+        if (d.what == change::CHANGED) {
+            to.add_text("field", d.before->what->field);
+            add_fact("before", *d.before);
+            add_fact("after", *d.after);
+        }
+        if (!reasons.empty())
+            add_reasons(reasons);
+        to.close();
     }
-    if (!breach(d).empty())
-        to.add_text("breaks", breach(d));
-    to.close();
-}
 
-void show_json(const diff_options &options, const std::vector<difference> &found) {
-    report::json_writer to(print);
-    to.open_object();
-    to.add_schema("cdef-diff.schema.json", 1);
-    to.add_text("before", options.before);
-    to.add_text("after", options.after);
-    to.open_list("differences");
-    for (const difference &d : found)
-        add_difference(to, d);
-    to.close();
-    to.close();
-}
-
-void show_text(const std::vector<difference> &found, bool one_class, bool with_reason) {
-    output out;
-    for (const difference &d : found) {
-        out.text += line_of(d, one_class, with_reason);
-        out.flush_if_full();
+private:
+    void add_name(std::string_view key, const node &n) {
+        text.clear();
+        writer.write_name(n);
+        to.add_text(key, text);
     }
-    out.flush();
-}
 
-node read(const std::string &path, std::unique_ptr<input> &in) {
-    in = std::make_unique<input>(path);
-    cdb::ownership owners = require_readable_aloud(*in).owners;
-    try {
-        return compare::meaning_of(in->db, owners);
-    } catch (const compare::too_entangled &e) {
-        throw failure(path + ": " + e.what());
+    void add_fact(std::string_view key, const compare::fact &f) {
+        text.clear();
+        writer.write_fact(f);
+        to.add_text(key, text);
     }
+
+    /* The first node is the database. */
+    void add_path(const difference &d) {
+        to.open_list("path");
+        for (const node *n : d.path.subspan(1)) {
+            to.open_object();
+            to.add_text("kind", n->label());
+            add_name("name", *n);
+            to.close();
+        }
+        to.close();
+    }
+
+    void add_reasons(const std::vector<const compare::breach_rule *> &reasons) {
+        to.open_list("breaks");
+        for (const compare::breach_rule *rule : reasons) {
+            to.open_object();
+            to.add_text("code", rule->code);
+            to.add_text("level", compare::name_of(rule->broken_for));
+            to.add_text("reason", rule->reason);
+            to.close();
+        }
+        to.close();
+    }
+
+    report::json_writer to;
+    std::string text;
+    compare::writer writer;
+    const diff_options &options;
+};
+
+/* ---- The comparison -------------------------------------------------------------------------------------------- */
+
+/* A database that is compared. */
+struct compared {
+    explicit compared(const std::string &path) : in(path), owners(require_readable_aloud(in).owners) {}
+
+    compare::origin origin() const {
+        return {in.db, owners};
+    }
+    bool has_one_class() const {
+        auto classes = in.db.classes();
+        auto first = classes.begin();
+        return first != classes.end() && ++first == classes.end();
+    }
+
+    input in;
+    cdb::ownership owners;
+};
+
+/* Without a level the option is "true". */
+std::optional<compare::level> level_of(const std::string &option) {
+    auto found = std::find_if(std::begin(compare::levels), std::end(compare::levels),
+                              [&option](compare::level l) { return compare::name_of(l) == option; });
+    if (found == std::end(compare::levels))
+        return option == "true" ? std::optional(compare::level::READERS) : std::nullopt;
+    return *found;
 }
 
+std::string check_level(const std::string &option) {
+    return level_of(option) ? "" : option + " is not a level: readers, clients or stored";
+}
+
+struct outcome {
+    bool found = false;                /* any of the differences that were asked for */
+    std::vector<std::string> mentions; /* what some want to know in any case; no difference of its own */
+};
+
+/* Whoever maps a database depends on its byte order, and whoever chooses between two goes by their versions. */
+std::string mention_of_order(const compared &before, const compared &after) {
+    return after.in.name + ": the other byte order than " + before.in.name;
+}
+
+std::string mention_of_version(const difference &d, const compared &before, const compared &after) {
+    return after.in.name + ": a lower version than " + before.in.name + ": " + text_of(*d.before) + " -> " +
+           text_of(*d.after);
+}
+
+template <class Form>
+outcome write_differences(const compared &before, const compared &after, const diff_options &options, Form &form) {
+    outcome came;
+    compare::level up_to = level_of(options.compat).value_or(compare::level::STORED);
+    form.begin();
+    compare::compare(before.origin(), after.origin(), [&](const difference &d) {
+        if (d.what == change::CHANGED && is_lower_version(*d.before, *d.after))
+            came.mentions.push_back(mention_of_version(d, before, after));
+        auto reasons = rules_broken(d, up_to);
+        if (!options.compat.empty() && reasons.empty())
+            return;
+        came.found = true;
+        if (options.compat.empty() && options.form != "json")
+            reasons.clear();
+        form.add(d, reasons);
+    });
+    form.end();
+    if (before.in.db.order() != after.in.db.order())
+        came.mentions.push_back(mention_of_order(before, after));
+    return came;
+}
+
+outcome write_to(held_output &out, const compared &before, const compared &after, const diff_options &options) {
+    std::size_t size = before.in.contents.size() + after.in.contents.size();
+    if (options.form == "json") {
+        document form(out, size, options);
+        return write_differences(before, after, options, form);
+    }
+    lines form(out, size, before.has_one_class() && after.has_one_class());
+    return write_differences(before, after, options, form);
+}
+
+/* What a long comparison writes is not kept; once it is known that there is an end, it is made again. */
 int diff(const diff_options &options) {
     if (options.before == "-" && options.after == "-")
         throw failure("only one of the two can be standard input");
-    std::unique_ptr<input> in_before, in_after;
-    node before = read(options.before, in_before);
-    node after = read(options.after, in_after);
-    std::vector<difference> found = compare::differences(before, after);
-    if (options.compat)
-        std::erase_if(found, [](const difference &d) { return breach(d).empty(); });
-    if (options.form == "json")
-        show_json(options, found);
-    else
-        show_text(found, has_one_class(before) && has_one_class(after), options.compat);
-    return found.empty() ? OK : FOUND;
+    compared before(options.before), after(options.after);
+    held_output out;
+    outcome came;
+    try {
+        came = write_to(out, before, after, options);
+    } catch (const compare::too_entangled &e) {
+        throw failure(options.before + ", " + options.after + ": " + e.what());
+    }
+    for (const std::string &mention : came.mentions)
+        print_error(mention);
+    if (out.has_lost()) {
+        out.begin_again();
+        write_to(out, before, after, options);
+    }
+    out.finish();
+    return came.found ? FOUND : OK;
 }
 
 } // namespace
@@ -143,11 +334,15 @@ void add_diff(CLI::App &app, int &status) {
     CLI::App *command = app.add_subcommand("diff", "Shows how two databases differ in meaning, not in layout");
     command->add_option("A", options->before, "First database; - is standard input")->required();
     command->add_option("B", options->after, "Second database; - is standard input")->required();
-    command->add_flag("--compat", options->compat,
-                      "Show only what keeps programs written for A from reading B, and why");
+    command
+        ->add_flag("--compat", options->compat,
+                   "Show only what breaks for whoever relies on A, and why: readers (without =), also clients, also "
+                   "what is stored")
+        ->check(check_level)
+        ->option_text("[=LEVEL:{readers,clients,stored}]");
     add_forms(*command, options->form, {"text", "json"}, "Form of the differences: text or json");
-    command->footer("Exit status: 0 if they are the same (with --compat: if programs written for A can read B), 1 if "
-                    "not, 2 if a database cannot be read.");
+    command->footer("Exit status: 0 if they are the same (with --compat: if B can take the place of A), 1 if not, 2 if "
+                    "a database cannot be read.");
     command->callback([options, &status] { status = diff(*options); });
 }
 

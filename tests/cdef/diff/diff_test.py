@@ -7,6 +7,8 @@ these blocks:
     with:       what stands there in the second source; no lines remove them
     diff:       what cdef diff says of the two; nothing if they are the same
     compat:     what cdef diff --compat says of them
+    clients:    what cdef diff --compat=clients says of them, if the case is about that
+    stored:     what cdef diff --compat=stored says of them, likewise
 
 replace and with may come several times.  Each comparison runs in all four combinations of
 byte orders, and cdef diff the other way round too, where all that is new and
@@ -31,7 +33,7 @@ from expectation import Expectation
 from programs import PROGRAMS, TESTS
 
 CASES = TESTS / "cdef" / "diff"
-BLOCKS = ("replace", "with", "diff", "compat")
+BLOCKS = ("replace", "with", "diff", "compat", "clients", "stored")
 TIMEOUT = 60
 TURNED = {"-": "+", "+": "-"}
 
@@ -92,7 +94,7 @@ def replaced(source, old, new):
 
 
 def read_case(path):
-    """The second source and the expected texts of both comparisons."""
+    """The second source, and the expected texts by the options of the comparison."""
     said = Expectation(path, (), BLOCKS)
     changes = said.all("replace", "with")
     if [name for name, _ in changes] != ["replace", "with"] * (len(changes) // 2):
@@ -102,15 +104,20 @@ def read_case(path):
         source = replaced(source, old, new)
     if not (said.has("diff") and said.has("compat")):
         raise ValueError(f"{path}: diff or compat is missing")
-    return source, said.get("diff"), said.get("compat")
+    compared = {"--compat": "compat", "--compat=readers": "compat", "--compat=clients": "clients", "--compat=stored": "stored"}
+    texts = {option: said.get(block) for option, block in compared.items() if said.has(block)}
+    return source, said.get("diff"), texts
 
 
 def turned(text):
     """What the comparison the other way round says, its lines in any order."""
     lines = []
     for line in text.splitlines():
-        if line[0] == "~":
-            words, _, values = line.partition(": ")
+        words, _, values = line.partition(": ")
+        if values.startswith("renamed to "):
+            front, _, name = words.rpartition(" ")
+            line = f"{front} {values.removeprefix('renamed to ')}: renamed to {name}"
+        elif line[0] == "~":
             label = next(label for label in LABELS if values.startswith(label + " "))
             before, after = values[len(label) + 1 :].split(" -> ")
             line = f"{words}: {label} {after} -> {before}"
@@ -160,17 +167,28 @@ def programs(directory):
     return Programs(directory)
 
 
+def mentioned(a, b, source):
+    """What standard error says of two databases of the base and another source, by their names."""
+    version = "\tFileVersion="
+    before, after = (text.partition(version)[2].partition("\n")[0] for text in (base(), source))
+    parts = [[int(part) for part in text.split(".")] for text in (before, after)]
+    lower = f"cdef: {b}: a lower version than {a}: {before} -> {after}\n" if parts[1] < parts[0] else ""
+    return lower + (f"cdef: {b}: the other byte order than {a}\n" if a[1:] != b[1:] else "")
+
+
 @pytest.mark.parametrize("name", sorted(path.stem for path in CASES.glob("*.expect")))
 def test_case(programs, name):
     """All comparisons of one case."""
-    source, difference, breaches = read_case(CASES / f"{name}.expect")
+    source, difference, compared = read_case(CASES / f"{name}.expect")
     databases = [
         (programs.compile(base(), f"a{order}.cdef", *order.split()), programs.compile(source, f"b{order}.cdef", *order.split()))
         for order in ("", "-s")
     ]
     for a, b in itertools.product((a for a, _ in databases), (b for _, b in databases)):
-        same(programs.diff(a, b), (1 if difference else 0, difference, ""), a, b)
-        same(programs.diff("--compat", a, b), (1 if breaches else 0, breaches, ""), "--compat", a, b)
+        mentions = mentioned(a, b, source)
+        same(programs.diff(a, b), (1 if difference else 0, difference, mentions), a, b)
+        for option, breaches in compared.items():
+            same(programs.diff(option, a, b), (1 if breaches else 0, breaches, mentions), option, a, b)
         status, back, _ = programs.diff(b, a)
         same((status, sorted(back.splitlines())), (1 if difference else 0, turned(difference)), b, a)
 
@@ -179,6 +197,7 @@ def test_case(programs, name):
 
 WRONG_CHECKSUM = "cdef: {}: wrong checksum\n"
 NOT_ZERO = "cdef: {}: reserved bytes or padding not zero\n"
+OTHER_ORDER = "cdef: {}: the other byte order than {}\n"
 MAP = base().partition("ClassToManagerMapping\n")[2]
 
 
@@ -204,7 +223,7 @@ def test_layout_is_not_compared(programs):
     moved = class_source(d, b.replace("\tDefaultValue=x\n", ""), a, head="\tName=C\n")
     second = programs.compile(moved, "second.cdef", "-s", stamp=True)
     programs.patch(second, 4, b"wrong sum"[:4])
-    same(programs.diff(first, second), (0, "", WRONG_CHECKSUM.format(second)), "diff")
+    same(programs.diff(first, second), (0, "", WRONG_CHECKSUM.format(second) + OTHER_ORDER.format(second, first)), "diff")
 
 
 def test_classes_are_named_where_there_are_several(programs):
@@ -254,7 +273,7 @@ def test_values_of_every_type(programs):
     stanzas = (attribute(t, 1, f"DefaultValue={v[0]}", datatype=t) for t, v in values.items())
     two = programs.compile(class_source(*stanzas, head="\tName=C\n"), "two.cdef", "-s")
     lines = [f"~ PersistentResourceAttribute '{t}': default {nothing.get(t, 0)} -> {v[1]}\n" for t, v in values.items()]
-    same(programs.diff(one, two), (1, "".join(lines), ""), "diff")
+    same(programs.diff(one, two), (1, "".join(lines), OTHER_ORDER.format(two, one)), "diff")
 
 
 def test_missing_values_are_nothing(programs):
@@ -317,7 +336,8 @@ def test_records_that_are_never_written_are_compared(programs):
     for name, number, text in CHANGED_NUMBERS:
         for a, b in itertools.product(make_images.ORDERS, repeat=2):
             one, two = programs.image(name, a), programs.image(name, b, number)
-            same(programs.diff(one, two), (1, text, ""), f"{name} {number} {a} {b}")
+            mention = OTHER_ORDER.format(two, one) if a != b else ""
+            same(programs.diff(one, two), (1, text, mention), f"{name} {number} {a} {b}")
 
 
 def test_places_in_a_class_hash_are_not_compared(programs):
@@ -347,12 +367,12 @@ def test_json_says_the_same(programs):
         "field": "ra_attr_id",
         "before": "1",
         "after": "3",
-        "breaks": "readers know it by its number",
+        "breaks": [{"code": "CMP102", "level": "readers", "reason": "readers know it by its number"}],
     }
     removed = {
         "change": "removed",
         "path": [*path, {"kind": "PersistentResourceAttribute", "name": "'B'"}],
-        "breaks": "readers miss it",
+        "breaks": [{"code": "CMP101", "level": "readers", "reason": "readers miss it"}],
     }
     same((status, differences_in(text)), (1, [changed, removed]), "different")
     status, text, _ = programs.diff("--json", one, one)
@@ -467,12 +487,15 @@ def test_values_of_another_are_not_told(programs):
 
 
 def test_values_that_lead_to_one_text_too_often_are_refused(programs):
-    """What would be told is out of proportion to the file; but not that they do."""
+    """If what would be written is out of proportion to the files; nothing is written of databases that are alike."""
     (programs.directory / "few.cdef").write_bytes(same_text(10, 32767))
-    same(programs.diff("few.cdef", "few.cdef"), (0, "", ""), "few")
-    (programs.directory / "many.cdef").write_bytes(same_text(100, 32767))
-    message = "cdef: many.cdef: values or texts that lead to the same place too often\n"
-    same(programs.diff("many.cdef", "many.cdef"), (2, "", message), "many")
+    (programs.directory / "many.cdef").write_bytes(same_text(1000, 32767))
+    same(programs.diff("many.cdef", "many.cdef"), (0, "", ""), "the same")
+    lines = "".join(f"+ DynamicResourceAttribute 'A{i}'\n" for i in range(10, 1000))
+    same(programs.diff("few.cdef", "many.cdef"), (1, lines, ""), "short names")
+    # In JSON each path begins with the class's name.
+    message = "cdef: few.cdef, many.cdef: values or texts that lead to the same place too often\n"
+    same(programs.diff("--json", "few.cdef", "many.cdef"), (2, "", message), "a long name")
 
 
 def test_one_may_be_standard_input(programs):

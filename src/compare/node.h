@@ -1,0 +1,112 @@
+/* node.h: the records of a database and the entries of its lists, as comparisons meet them. They are made when they are
+ * asked for; only their places are kept. */
+#ifndef CDGEN_COMPARE_NODE_H
+#define CDGEN_COMPARE_NODE_H
+
+#include "compare/kinds.h"
+#include "compare/value.h"
+
+#include <optional>
+#include <variant>
+
+namespace compare {
+
+/* A database that is compared. Both must outlive all that comes from it. */
+struct origin {
+    const cdb::database &db;
+    const cdb::ownership &owners;
+};
+
+/* A section, as far as its records need it. */
+struct section_tables {
+    cdb::class_tables tables = {};
+    std::string_view first_text = {}; /* the text at 0. Any number of references may lead to it, so it is found once */
+};
+
+/* A record, or an entry of a list. */
+struct node {
+    node_kind kind;
+    const origin *from = nullptr;
+    const cdb::record_format *format = nullptr; /* of its record; null: it has no facts but those of an anchor */
+    cdb::bytes area{};                          /* that the record is in */
+    std::size_t at = 0;                         /* where */
+    std::size_t index = 0;                      /* of an element in its structure; of a section among the anchors */
+    vx_data_type_t type = VX_UNKNOWN;           /* of a valid value */
+    const cdb::field_fact *field = nullptr;     /* of an element: leads to its structure; null for any other kind */
+    const section_tables *section = nullptr;    /* null: the whole database, or one of its sections */
+
+    /* What a report calls its kind: "PersistentResourceAttribute", "valid value", "input element". */
+    std::string_view label() const {
+        return field != nullptr ? field->label() : row_of(kind).text;
+    }
+};
+
+/* The place of an element in its structure, which no field holds. */
+inline constexpr cdb::field_fact ELEMENT_INDEX = {.field = "ElementIndex", .words = "index"};
+
+/* What a record says in one field. */
+struct fact {
+    const cdb::field_fact *what; /* outlives the fact */
+    std::variant<std::uint32_t, std::string_view, owned_value> is;
+};
+
+/* ---- Whole databases and sections ------------------------------------------------------------------------------ */
+
+node database_node(const origin &from);
+
+/* A section as a part of its database: it has a name, but neither facts nor parts. room: for its tables. */
+node section_node(const origin &from, std::size_t index, section_tables &room);
+
+/* ---- Facts ----------------------------------------------------------------------------------------------------- */
+
+/* The number that a field of the record says, or a part of a reference that is a number. */
+std::uint32_t number_in(const node &n, const cdb::field &f);
+
+/* The text that a reference of the record leads to; empty for none. */
+std::string_view text_in(const node &n, const cdb::field &f);
+
+/* The data type that the record names for its values; VX_UNKNOWN if it names none. */
+vx_data_type_t data_type_of(const node &n);
+
+/* What the record says in the field at a position in its format; nothing if that is no content, or if the field leads
+ * to parts. */
+std::optional<fact> fact_in(const node &n, std::size_t field_index);
+
+/* ---- Parts ----------------------------------------------------------------------------------------------------- */
+
+/* Parts that follow each other in the file. */
+struct family {
+    node first;
+    std::size_t count = 0;
+    std::size_t size = 0; /* bytes of one */
+
+    node at(std::size_t index) const;
+};
+
+/* At most so many families belong to one record: a class has inputs and tables. */
+inline constexpr std::size_t FAMILIES_MAX = 16;
+
+struct families {
+    std::array<family, FAMILIES_MAX> all;
+    std::size_t count = 0;
+
+    void add(const family &one) {
+        all.at(count++) = one;
+    }
+    void clear() {
+        count = 0;
+    }
+};
+
+/* Whether nodes of this kind can have parts. */
+constexpr bool may_have_parts(node_kind kind) {
+    return kind < node_kind::variety || kind == node_kind::element;
+}
+
+/* The parts of a record, not of a database. Two nodes of one kind have families of the same kinds in the same order,
+ * some of which may be empty. */
+void add_families(const node &n, families &to);
+
+} // namespace compare
+
+#endif

@@ -1,0 +1,56 @@
+/* writer.h: names, facts and values as a person reads them. */
+#ifndef CDGEN_COMPARE_WRITER_H
+#define CDGEN_COMPARE_WRITER_H
+
+#include "compare/node.h"
+
+#include <functional>
+#include <stdexcept>
+#include <string>
+
+namespace compare {
+
+/* Thrown for databases made by hand in which so many references lead to the same texts that writing them would take far
+ * more room than the databases do. */
+struct too_entangled : std::runtime_error {
+    using std::runtime_error::runtime_error;
+};
+
+/* Writes values as a person reads them: 5, 0.1, 'text', 0x0102, [1, 2], {Int32 0}, nothing, misplaced 5.
+ *
+ * In a database that was compiled each long text has one owner, so all of them together are no larger than the file. In
+ * one made by hand, many references may lead to one text, and a long name may have many parts. So what is written is
+ * counted: beyond a limit, every function throws too_entangled. */
+class writer {
+public:
+    using taker = std::function<void(std::string_view)>;
+
+    /* size: of the databases together, in bytes. The pieces of what is written go to `to`. */
+    writer(std::size_t size, taker to);
+
+    void write(std::string_view plain) const {
+        take(plain);
+    }
+    void write_value(const owned_value &value);
+    void write_fact(const fact &f);
+    /* The name of a record, or what an entry of a list has in its place. Nothing for a record that has none. */
+    void write_name(const node &n);
+
+private:
+    void write_text(std::string_view text);
+    void write_bytes(std::string_view bytes);
+    void write_elements(const owned_value &value, std::size_t count);
+    void write_valid_value(const node &n);
+    void spend(std::size_t amount);
+
+    std::size_t left;
+    taker take;
+};
+
+std::string text_of(const fact &f);
+std::string name_of(const node &n);
+bool has_name(const node &n);
+
+} // namespace compare
+
+#endif

@@ -6,6 +6,7 @@ keep their width while a dimension grows, so that only the count changes.
 """
 
 import argparse
+import re
 import sys
 import typing
 
@@ -211,6 +212,23 @@ DIMENSIONS = {
 }
 
 
+def commented(pieces):
+    """The same definitions as people write them: a comment in front of each, texts in quotes, notes behind values."""
+    for piece in pieces:
+        name = re.search(r"\tName=(.*)\n", piece)
+        piece = re.sub(r"\t(Name|Properties)=(.*)\n", r'\t\1="\2"\n', piece)
+        piece = re.sub(r"\t(DataType|GroupID)=(.*)\n", r"\t\1=\2  # as agreed\n", piece)
+        yield (f"\n// {name[1]}, see \"Attributes\" in the catalogue\n" if name else "") + piece
+
+
+def large_source(classes, each):
+    """Classes with so many mixed attributes each."""
+    for index in range(classes):
+        yield HEAD.format(name=f"Class_{100000 + index}")
+        yield from attributes(each, None)
+    yield TAIL
+
+
 def source(classes=1, members_count=0, string_length=STRING_LENGTH, **counts):
     """The pieces of a source; all but the classes' heads belong to the last class."""
     for index in range(classes):
@@ -238,6 +256,7 @@ def parse():
     parser.add_argument("--members", dest="members_count", type=number, default=0, metavar="N",
                         help="dynamic attributes that name variable classes")
     parser.add_argument("--classes", type=number, default=1, metavar="N", help="at least 1")
+    parser.add_argument("--comments", action="store_true", help="comments and quotes in all definitions")
     parser.add_argument("--string-length", type=number, default=STRING_LENGTH, metavar="N",
                         help=f"of the texts that --strings makes: 6 to {STRING_LENGTH_MAX}")
     options = parser.parse_args()
@@ -249,4 +268,6 @@ def parse():
 
 
 if __name__ == "__main__":
-    sys.stdout.writelines(source(**vars(parse())))
+    wanted = vars(parse())
+    with_comments = wanted.pop("comments")
+    sys.stdout.writelines(commented(source(**wanted)) if with_comments else source(**wanted))

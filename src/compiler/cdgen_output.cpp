@@ -121,10 +121,11 @@ output_fd create_output(cdgen &cx) {
 /* Writes 1024-byte zero blocks until there are at least size bytes, many of them at a time. */
 size_t prefill(int fd, size_t size) {
     constexpr size_t BLOCKS_AT_ONCE = 512;
-    static std::array<char, PREFILL_BLOCK> zeros;
+    static const std::array<char, PREFILL_BLOCK> zeros = {};
     std::array<iovec, BLOCKS_AT_ONCE> blocks;
     size_t gross = (size + PREFILL_BLOCK - 1) / PREFILL_BLOCK * PREFILL_BLOCK;
-    std::fill_n(blocks.begin(), std::min(blocks.size(), gross / PREFILL_BLOCK), iovec{zeros.data(), zeros.size()});
+    std::fill_n(blocks.begin(), std::min(blocks.size(), gross / PREFILL_BLOCK),
+                iovec{const_cast<char *>(zeros.data()), zeros.size()});
     for (size_t written = 0; written < gross;) {
         size_t left = gross - written;
         blocks[0].iov_len = (left - 1) % PREFILL_BLOCK + 1; /* what a short write has left of its block */

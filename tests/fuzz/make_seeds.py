@@ -39,14 +39,14 @@ def sources():
         yield generate_sources.source(seed)[0]
 
 
-def compile_source(cdgen, directory, text, name):
+def compile_source(command, directory, text, name):
     """Writes a source's databases, if it has any."""
     source = directory / "text"
     source.write_bytes(text)
     for suffix, option in (("", []), ("-turned", ["-s"])):
         out = directory / f"{name}{suffix}.cdef"
         environment = {**os.environ, "VX_CDB_FORCE_EMPTY_TIMESTAMP": ""}
-        subprocess.run([cdgen, *option, source, out], env=environment, capture_output=True, check=False)
+        subprocess.run([*command, *option, source, out], env=environment, capture_output=True, check=False)
     source.unlink()
 
 
@@ -73,9 +73,9 @@ def escaped(word):
     return f'"{text}"\n'
 
 
-def words(list_names):
+def words(command):
     """Every word of the language, with what stands around it."""
-    listed = subprocess.run([list_names], capture_output=True, text=True, check=True).stdout
+    listed = subprocess.run(command, capture_output=True, text=True, check=True).stdout
     for line in listed.splitlines():
         what, *rest = line.split()
         if what == "stanza":
@@ -94,18 +94,20 @@ def main():
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--cdgen", type=pathlib.Path, required=True)
     parser.add_argument("--list-names", type=pathlib.Path, required=True)
+    parser.add_argument("--runner", default="", help="the words, separated by ;, that programs of another machine need")
     parser.add_argument("directory", type=pathlib.Path)
     options = parser.parse_args()
+    runner = [word for word in options.runner.split(";") if word]
     for name in ("source", "image", "cdef"):
         (options.directory / name).mkdir(parents=True, exist_ok=True)
     for number, text in enumerate(sources()):
         option = OPTIONS[number % len(OPTIONS)]
         (options.directory / "source" / str(number)).write_bytes(bytes([option]) + text)
-        compile_source(options.cdgen.resolve(), options.directory / "image", text, number)
+        compile_source([*runner, options.cdgen.resolve()], options.directory / "image", text, number)
     command = [sys.executable, "-B", TESTS / "support" / "make_images.py", "--out", options.directory / "image"]
     subprocess.run(command, check=True)
     write_cdef_seeds(options.directory)
-    dictionary = sorted({escaped(word) for word in words(options.list_names.resolve())})
+    dictionary = sorted({escaped(word) for word in words([*runner, options.list_names.resolve()])})
     (options.directory / "source.dict").write_text("".join(dictionary))
 
 

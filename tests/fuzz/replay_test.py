@@ -4,7 +4,7 @@ import subprocess
 
 import pytest
 
-from programs import PROGRAMS, TESTS
+from programs import PROGRAMS, TESTS, runner
 
 FUZZERS = ("source", "image", "cdef")
 FOUND = [what for what in FUZZERS if any((TESTS / "fuzz/found" / what).glob("*"))]
@@ -13,7 +13,7 @@ FOUND = [what for what in FUZZERS if any((TESTS / "fuzz/found" / what).glob("*")
 def replay(what, directory):
     """Give a fuzz target all files of a directory."""
     assert any(directory.iterdir()), f"nothing in {directory}"
-    command = [PROGRAMS.build / "tests/fuzz" / f"{what}_fuzz", directory]
+    command = [*runner(), PROGRAMS.build / "tests/fuzz" / f"{what}_fuzz", directory]
     done = subprocess.run(command, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, timeout=1800, check=False)
     assert done.returncode == 0, done.stdout.decode(errors="replace")[-5000:]
 

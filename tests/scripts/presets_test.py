@@ -6,7 +6,7 @@ import pytest
 from programs import PROJECT
 
 PRESETS = {row["name"]: row for row in json.loads((PROJECT / "CMakePresets.json").read_text())["configurePresets"]}
-DEVELOPERS = {"test", "clang", "debug", "sanitize"}
+DEVELOPERS = {"test", "clang", "debug", "sanitize", "threads", "i686", "armhf"}
 
 
 def variables(name):

@@ -110,7 +110,7 @@ def run(case, program, extra):
         operands = shlex.split(case.keys["operands"])
     else:
         operands = [case.source.name, case.out]
-    command = shlex.split(os.environ.get("CDGEN_RUNNER", ""))
+    command = programs.runner()
     command += ["./cdgen", *extra, *shlex.split(case.keys.get("args", "")), *operands]
     with tempfile.TemporaryDirectory() as name:
         directory = pathlib.Path(name)

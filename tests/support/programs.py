@@ -3,6 +3,7 @@
 import os
 import pathlib
 import re
+import shlex
 
 TESTS = pathlib.Path(__file__).resolve().parents[1]
 PROJECT = TESTS.parent
@@ -36,6 +37,11 @@ class Programs:
     def is_on(self, option):
         """Whether an option of the build is on."""
         return self.cache.get(option, "OFF").upper() in ("ON", "1", "TRUE", "YES")
+
+
+def runner():
+    """The words in front of a program that another machine is needed for."""
+    return shlex.split(os.environ.get("CDGEN_RUNNER", ""))
 
 
 def environment(**more):

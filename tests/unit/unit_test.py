@@ -8,14 +8,14 @@ import tempfile
 
 import pytest
 
-from programs import PROGRAMS
+from programs import PROGRAMS, runner
 
 TIMEOUT = 600
 
 
 def listed():
     """The names of all tests: suite -> tests."""
-    command = [PROGRAMS.unit, "--gtest_list_tests"]
+    command = [*runner(), PROGRAMS.unit, "--gtest_list_tests"]
     text = subprocess.run(command, stdout=subprocess.PIPE, text=True, check=True, timeout=TIMEOUT).stdout
     found, suite = collections.defaultdict(list), None
     for line in text.splitlines():
@@ -30,7 +30,7 @@ def listed():
 def run(chosen):
     """What the tests that a filter chooses have to say: name -> report; and the end of a run that did not reach it."""
     with tempfile.NamedTemporaryFile(suffix=".json") as report:
-        command = [PROGRAMS.unit, f"--gtest_filter={chosen}", f"--gtest_output=json:{report.name}"]
+        command = [*runner(), PROGRAMS.unit, f"--gtest_filter={chosen}", f"--gtest_output=json:{report.name}"]
         done = subprocess.run(command, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, timeout=TIMEOUT, check=False)
         text = report.read()
     suites = json.loads(text)["testsuites"] if text else []

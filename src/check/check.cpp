@@ -21,14 +21,17 @@ constexpr size_t RETURNS_MAX = 65536; /* carriage returns that are removed at on
 
 /* One check of one source, whose name must stay as long. */
 struct source_check {
-    source_check(const std::string &name, const warning_set &wanted, const sink &handed_to)
-        : compiler(name.c_str()), to(handed_to), warned(wanted, found) {}
+    source_check(const std::string &name, const warning_set &wanted, const sink &handed_to, const compile_job *compile)
+        : job(compile), compiler(name.c_str(), job == nullptr ? nullptr : job->output.c_str()), to(handed_to),
+          warned(wanted, found) {}
 
     totals run();
     void take(const source_line &source);
     void hand_over(finding &&each);
     bool is_open(warning_id id, int at_line) const;
+    void finish();
 
+    const compile_job *job; /* null: the source is only checked */
     compilation compiler;
     current_line line;
     knowledge known;
@@ -90,19 +93,31 @@ totals source_check::run() {
     compiler.close();
     line.end_source();
     recover.close_all();
+    finish();
     return found.close();
+}
+
+void source_check::finish() {
+    if (job == nullptr || found.errors() > 0)
+        return;
+    try {
+        job->finish(compiler);
+    } catch (const fatal_exit &failure) {
+        throw cannot_check(std::string(compiler.name()) + ": " + text_of(failure));
+    }
 }
 
 } // namespace
 
-totals check_bytes(std::string_view bytes, const std::string &name, const warning_set &wanted, const sink &to) {
-    auto one = std::make_unique<source_check>(name, wanted, to);
+totals check_bytes(std::string_view bytes, const std::string &name, const warning_set &wanted, const sink &to,
+                   const compile_job *job) {
+    auto one = std::make_unique<source_check>(name, wanted, to, job);
     one->compiler.open_bytes(bytes);
     return one->run();
 }
 
-totals check_file(const std::string &path, const warning_set &wanted, const sink &to) {
-    auto one = std::make_unique<source_check>(path, wanted, to);
+totals check_file(const std::string &path, const warning_set &wanted, const sink &to, const compile_job *job) {
+    auto one = std::make_unique<source_check>(path, wanted, to, job);
     try {
         if (path == "-") /* by its descriptor: it may not be a file, or be half read */
             one->compiler.open(fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));

@@ -11,6 +11,8 @@
 #include <string_view>
 #include <vector>
 
+class stepwise_compiler;
+
 namespace check {
 
 /* ---- Warnings (warnings/registry.cpp) --------------------------------------------------------------------------- */
@@ -54,6 +56,7 @@ enum warning_id {
     OVERLAP,
     OUTER_BLANK,
     UNBALANCED,
+    NO_NAME,
     WARNING_COUNT
 };
 
@@ -132,12 +135,21 @@ struct cannot_check : std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
+/* What is done with a source that is to be compiled, too. */
+struct compile_job {
+    /* A class without a Name is called after this file, to which nothing is written. */
+    std::string output;
+    /* Is given the compilation, all steps of which have been taken, of a source without errors. */
+    std::function<void(stepwise_compiler &)> finish;
+};
+
 /* Checks a source that is in memory. Its name appears in cannot_check only, which is thrown if memory
- * runs out. */
-totals check_bytes(std::string_view bytes, const std::string &name, const warning_set &wanted, const sink &to);
+ * runs out. With a job, the same pass compiles it. */
+totals check_bytes(std::string_view bytes, const std::string &name, const warning_set &wanted, const sink &to,
+                   const compile_job *job = nullptr);
 
 /* Checks a file; "-" is standard input. It is read in portions. Throws cannot_check. */
-totals check_file(const std::string &path, const warning_set &wanted, const sink &to);
+totals check_file(const std::string &path, const warning_set &wanted, const sink &to, const compile_job *job = nullptr);
 
 } // namespace check
 

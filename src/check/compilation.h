@@ -15,11 +15,17 @@ std::string text_of(const fatal_exit &failure);
 
 class compilation : private line_observer, public stepwise_compiler {
 public:
-    /* The source's name must stay as long as this. */
-    explicit compilation(const char *source) : stepwise_compiler(source, CLASS_NAME, *this), source_name(source) {}
+    /* The names must stay as long as this. output: after which a class without a Name is called; null if it is not
+     * known, and any will do. */
+    compilation(const char *source, const char *output)
+        : stepwise_compiler(source, output == nullptr ? CLASS_NAME : output, *this), source_name(source),
+          output_name(output) {}
 
     const char *name() const {
         return source_name;
+    }
+    const char *output() const {
+        return output_name;
     }
 
     /* Takes an attribute line. Throws fatal_exit. */
@@ -51,7 +57,7 @@ public:
     }
 
 private:
-    static constexpr const char *CLASS_NAME = "class.cdef"; /* the output file is not known: any good name */
+    static constexpr const char *CLASS_NAME = "class.cdef";
 
     void attribute_read(const attr_place &read) override {
         attribute = read;
@@ -61,6 +67,7 @@ private:
     }
 
     const char *source_name;
+    const char *output_name;
     attr_place attribute;
     kind_set broken;
 };

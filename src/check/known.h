@@ -131,6 +131,12 @@ struct knowledge {
     stanza_record &stanza() {
         return stanzas[index_of(kind)];
     }
+    /* The later of the two that a class begins with. */
+    const stanza_record &class_stanza() const {
+        const stanza_record &first = stanzas[SC_CONTROL_DEFINITION];
+        const stanza_record &second = stanzas[SC_RESOURCE_CLASS];
+        return second.header.line > first.header.line ? second : first;
+    }
 
     int kind = NO_KIND;        /* of the current stanza */
     bool skipping = false;     /* nothing of the current stanza can be understood */

@@ -259,6 +259,11 @@ void keys(noting &n) {
         n.show_missing();
 }
 
+void invalid_output(noting &n) {
+    const stanza_record &stanza = n.see.known.class_stanza();
+    n.show({stanza.header, {}, stanza.source}, "this class has no `Name`, and is called after its database");
+}
+
 struct notes_of {
     message_id id;
     void (*add)(noting &);
@@ -298,6 +303,7 @@ constexpr notes_of table[] = {
     {MSG_NO_MAPS, no_map},
     {MSG_NO_MANAGER, no_manager},
     {MSG_KEYS_REVERSED, keys},
+    {MSG_INVALID_OUTPUT_NAME, invalid_output},
 };
 
 } // namespace

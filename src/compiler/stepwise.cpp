@@ -5,6 +5,7 @@
 #include "compiler/cdgen_closing.h"
 #include "compiler/cdgen_kinds.h"
 #include "compiler/cdgen_stanzas.h"
+#include "compiler/cdgen_swap.h"
 
 #include <tuple>
 
@@ -78,6 +79,11 @@ void stepwise_compiler::size_image() {
 
 std::vector<std::byte> stepwise_compiler::image() {
     return image_in_memory(cx);
+}
+
+std::vector<std::byte> stepwise_compiler::reversed(std::vector<std::byte> image) const {
+    cdgen_cdef_swap(reinterpret_cast<char *>(image.data()), cx.stray.nowhere, cx.stray.to_numbers);
+    return image;
 }
 
 /* ---- State ----------------------------------------------------------------------------------------------------- */

@@ -31,6 +31,8 @@ public:
     void size_image();
     /* The database, in the machine's own byte order; after all closing steps. */
     std::vector<std::byte> image();
+    /* That image in the other byte order. */
+    std::vector<std::byte> reversed(std::vector<std::byte> image) const;
 
     /* ---- State ---- */
 
@@ -45,6 +47,10 @@ public:
     }
     bool class_is_open() const {
         return cx.staged.cb_rsrc_class.rc_cb_ID != 0;
+    }
+    /* Whether the open class has a Name. */
+    bool class_has_name() const {
+        return cx.staged.cb_rsrc_class.u_rc_name.offset[0] != CDB_NONE;
     }
     /* The kind of the stanza before the current one; -1: none. */
     int previous_kind() const;

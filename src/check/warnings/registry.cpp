@@ -15,11 +15,11 @@ namespace check {
 /* To add a warning: a class in a file of this folder, its maker, a row, its id, and an example (examples.cpp). */
 maker make_carriage_return, make_class_bit, make_comma_list, make_comment_in_value, make_cut_short, make_element_type,
     make_group, make_ignored_range, make_incomplete, make_intervals, make_invalid_default, make_long_line,
-    make_lost_bytes, make_low_above_high, make_narrowed, make_no_expression, make_no_resource_class, make_number_text,
-    make_octal, make_outer_blank, make_overlap, make_overridden, make_permission, make_properties, make_range_elsewhere,
-    make_same_id, make_same_name, make_sd_run_at_end, make_sd_without_run, make_second_resource_class, make_stray_run,
-    make_text_after_quote, make_unbalanced, make_unknown_locator, make_unknown_variable_class, make_unused_default,
-    make_unused_variable_class;
+    make_lost_bytes, make_low_above_high, make_narrowed, make_no_expression, make_no_name, make_no_resource_class,
+    make_number_text, make_octal, make_outer_blank, make_overlap, make_overridden, make_permission, make_properties,
+    make_range_elsewhere, make_same_id, make_same_name, make_sd_run_at_end, make_sd_without_run,
+    make_second_resource_class, make_stray_run, make_text_after_quote, make_unbalanced, make_unknown_locator,
+    make_unknown_variable_class, make_unused_default, make_unused_variable_class;
 
 namespace {
 
@@ -212,6 +212,11 @@ constexpr row rows[] = {
       "understood.",
       "Correct the name, or define the variable class."},
      make_unknown_variable_class},
+    {{NO_NAME, "S601", "no-name", "a class is called after its database",
+      "A class has no `Name`, so it is called what its database is called in front of `.cdef`, directory and all. "
+      "Only `cdef build` reports it, because it knows the database.",
+      "Give the `ResourceClass` a `Name`."},
+     make_no_name},
 };
 
 constexpr std::array<warning, WARNING_COUNT> by_id() {

@@ -38,6 +38,31 @@ public:
     }
 };
 
+/* Where the output is known: a class that is called after it. If that is no name, the compiler says so. */
+class no_name : public watcher {
+public:
+    using watcher::watcher;
+
+    /* Several steps at the end of the source come before the one that completes the class. */
+    void before_step(const view &see, int next_kind) override {
+        if (next_kind != SC_CONTROL_DEFINITION && next_kind != NO_KIND)
+            return;
+        std::string_view output = see.compiler.output() == nullptr ? "" : see.compiler.output();
+        size_t suffix = output.find(".cdef");
+        const stanza_record &stanza = see.known.class_stanza();
+        if (suffix == output.npos || see.errors() > 0 || stanza.header.line == reported ||
+            !see.compiler.class_is_open() || see.compiler.class_has_name())
+            return;
+        reported = stanza.header.line;
+        report(stanza.header, stanza.source,
+               "the class has no `Name`: it is called " + language::quoted(output.substr(0, suffix)) +
+                   ", after the database");
+    }
+
+private:
+    int reported = 0; /* line of the class that has been reported; 0: none */
+};
+
 } // namespace
 
 made_watcher make_incomplete(const watcher_setup &setup) {
@@ -46,6 +71,10 @@ made_watcher make_incomplete(const watcher_setup &setup) {
 
 made_watcher make_cut_short(const watcher_setup &setup) {
     return make<cut_short>(setup);
+}
+
+made_watcher make_no_name(const watcher_setup &setup) {
+    return make<no_name>(setup);
 }
 
 } // namespace check

@@ -1,6 +1,7 @@
 /* The checking library: bytes in, findings out. */
 
 #include "check/found_in.h"
+#include "compiler/stepwise.h"
 
 namespace {
 
@@ -52,6 +53,69 @@ TEST(Check, SaysWhichFileCannotBeRead) {
     } catch (const check::cannot_check &failure) {
         EXPECT_STREQ(failure.what(), "/nowhere/at all: cannot open because: No such file or directory");
     }
+}
+
+/* ---- Compiling in the same pass --------------------------------------------------------------------------------- */
+
+std::string text_of(const std::vector<std::byte> &image) {
+    return {reinterpret_cast<const char *>(image.data()), image.size()};
+}
+
+const std::string NAMELESS = CLASS.substr(0, CLASS.find("\tName=Pump\n")) + CLASS.substr(CLASS.find("ClassToManager"));
+
+TEST(Compile, MakesTheDatabaseInBothByteOrders) {
+    std::string native, reversed;
+    check::compile_job job = {"Out.cdef", [&](stepwise_compiler &compiler) {
+                                  std::vector<std::byte> image = compiler.image();
+                                  native = text_of(image);
+                                  reversed = text_of(compiler.reversed(std::move(image)));
+                              }};
+    check::totals count = check::check_bytes(
+        CLASS, "x", found_in::all_warnings(), [](check::finding &&) {}, &job);
+    EXPECT_EQ(count.errors + count.warnings, 0u);
+    EXPECT_EQ(native.size(), reversed.size());
+    EXPECT_EQ(native.substr(8, 4), std::string(reversed.rbegin() + static_cast<long>(reversed.size()) - 12,
+                                               reversed.rbegin() + static_cast<long>(reversed.size()) - 8));
+    EXPECT_NE(native.find("Pump"), std::string::npos);
+}
+
+/* What is found if a source is compiled to an output; with the output's bytes, if there are any. */
+codes compiled(const std::string &source, const std::string &output, std::string &image) {
+    codes found;
+    check::compile_job job = {output, [&](stepwise_compiler &compiler) { image = text_of(compiler.image()); }};
+    check::check_bytes(
+        source, "x", found_in::all_warnings(),
+        [&](check::finding &&each) { found.push_back(found_in::shown(each) + " " + each.text); }, &job);
+    return found;
+}
+
+TEST(Compile, MakesNothingOfASourceWithErrors) {
+    std::string image;
+    EXPECT_EQ(compiled(CLASS + "Unknwon\n", "Out.cdef", image), codes{"S101 16:1+7 Invalid table name: Unknwon"});
+    EXPECT_EQ(image, "");
+}
+
+TEST(Compile, WarnsOfAClassThatIsCalledAfterTheOutput) {
+    std::string image;
+    EXPECT_EQ(compiled(NAMELESS, "d.cdef/Out.cdef", image),
+              codes{"S601 3:1+13 the class has no `Name`: it is called `d`, after the database"});
+    EXPECT_NE(image.find(std::string("d\0", 2)), std::string::npos);
+    EXPECT_EQ(found_in(NAMELESS), codes());
+}
+
+TEST(Compile, WarnsOfEachNamelessClassOnce) {
+    std::string image;
+    EXPECT_EQ(compiled("ControlDefinition\n\tFileVersion=1\n" + NAMELESS, "O.cdef", image),
+              (codes{"S523 1:1+17 the class has no `ResourceClass`: its properties and message numbers are 0",
+                     "S601 1:1+17 the class has no `Name`: it is called `O`, after the database",
+                     "S601 5:1+13 the class has no `Name`: it is called `O`, after the database"}));
+}
+
+TEST(Compile, RefusesANamelessClassIfTheOutputGivesNone) {
+    std::string image;
+    EXPECT_EQ(compiled(NAMELESS, "-", image), codes{"S308 14 Invalid cdef out file name (must end in .cdef)"});
+    EXPECT_EQ(compiled(CLASS, "-", image), codes());
+    EXPECT_NE(image, "");
 }
 
 TEST(Recovery, ReportsAMisspeltPermissionAfterASecondName) {

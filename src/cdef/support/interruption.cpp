@@ -1,0 +1,98 @@
+/* interruption.cpp: holds signals back while work is done that they must not cut in two. */
+
+#include "cdef/support/interruption.h"
+
+#include <atomic>
+#include <condition_variable>
+#include <mutex>
+
+namespace cdef {
+
+namespace {
+
+/* Those that end a program and do not say that it is defective, unless they are ignored, as under nohup. */
+sigset_t ending_signals() {
+    sigset_t set;
+    sigemptyset(&set);
+    for (int signal : {SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGXCPU, SIGALRM, SIGPROF, SIGVTALRM, SIGUSR1, SIGUSR2}) {
+        struct sigaction action = {};
+        if (sigaction(signal, nullptr, &action) == 0 && action.sa_handler != SIG_IGN)
+            sigaddset(&set, signal);
+    }
+    return set;
+}
+
+/* All uninterrupted work of the process. */
+class work_count {
+public:
+    /* Does not return once the program is about to end. */
+    void begin() {
+        std::unique_lock hold(guard);
+        changed.wait(hold, [this] { return !ending; });
+        ++works;
+    }
+    void end() {
+        std::lock_guard hold(guard);
+        --works;
+        changed.notify_all();
+    }
+    /* Returns when there is no work, and there will be none. */
+    void stop() {
+        std::unique_lock hold(guard);
+        ending = true;
+        changed.wait(hold, [this] { return works == 0; });
+    }
+
+private:
+    std::mutex guard;
+    std::condition_variable changed;
+    int works = 0;
+    bool ending = false;
+};
+
+work_count all_work;
+std::atomic<bool> watch_is_over = false;
+
+} // namespace
+
+uninterrupted::uninterrupted() : before() {
+    all_work.begin();
+    sigset_t held = ending_signals();
+    pthread_sigmask(SIG_BLOCK, &held, &before);
+}
+
+uninterrupted::~uninterrupted() {
+    all_work.end();
+    pthread_sigmask(SIG_SETMASK, &before, nullptr);
+}
+
+interruption_watch::interruption_watch() : watched(ending_signals()), before() {
+    sigaddset(&watched, SIGUSR2); /* ends the watch, too */
+    pthread_sigmask(SIG_BLOCK, &watched, &before);
+    watch_is_over = false;
+    watcher = std::thread([this] { watch(); });
+}
+
+interruption_watch::~interruption_watch() {
+    watch_is_over = true;
+    pthread_kill(watcher.native_handle(), SIGUSR2);
+    watcher.join();
+    pthread_sigmask(SIG_SETMASK, &before, nullptr);
+}
+
+void interruption_watch::watch() {
+    int signal = 0;
+    while (sigwait(&watched, &signal) == 0 && !watch_is_over) {
+        struct sigaction action = {};
+        if (sigaction(signal, nullptr, &action) == 0 && action.sa_handler == SIG_IGN)
+            continue;
+        all_work.stop();
+        sigset_t taken;
+        sigemptyset(&taken);
+        sigaddset(&taken, signal);
+        pthread_sigmask(SIG_UNBLOCK, &taken, nullptr);
+        raise(signal);
+    }
+}
+
+} // namespace cdef

@@ -1,0 +1,271 @@
+/* replacement.cpp: writes a temporary file, and renames it over its target. */
+
+#include "cdef/support/replacement.h"
+
+#include "cdef/support/failure.h"
+#include "cdef/support/interruption.h"
+#include "text/hex.h"
+
+#include <array>
+#include <cerrno>
+#include <climits>
+#include <cstdint>
+#include <cstdio>
+#include <cstring>
+#include <fcntl.h>
+#include <optional>
+#include <sys/file.h>
+#include <sys/stat.h>
+#include <unistd.h>
+#include <utility>
+
+namespace cdef {
+
+namespace {
+
+constexpr std::string_view MARK = ".cdef-new";
+constexpr int MOST_LINKS = 40;   /* as many as Linux follows */
+constexpr int MOST_TRIES = 1000; /* to make a file that other programs make and remove */
+constexpr mode_t NEW_MODE = 0644;
+constexpr mode_t PRIVATE_MODE = 0600; /* until the contents are whole */
+
+/* The end of a step: its message is completed by what knows the path. */
+struct step_failed {
+    int error;
+};
+
+void require(bool done) {
+    if (!done)
+        throw step_failed{errno};
+}
+
+/* A descriptor that closes itself. */
+class descriptor {
+public:
+    explicit descriptor(int opened) : fd(opened) {}
+    descriptor(descriptor &&other) noexcept : fd(std::exchange(other.fd, -1)) {}
+    descriptor(const descriptor &) = delete;
+    descriptor &operator=(const descriptor &) = delete;
+    descriptor &operator=(descriptor &&) = delete;
+    ~descriptor() {
+        if (fd >= 0)
+            ::close(fd);
+    }
+
+    bool is_open() const {
+        return fd >= 0;
+    }
+    int get() const {
+        return fd;
+    }
+    /* The last chance of a file system to say that it could not write. */
+    void close() {
+        require(::close(std::exchange(fd, -1)) == 0);
+    }
+
+private:
+    int fd;
+};
+
+bool is_same_file(const struct stat &a, const struct stat &b) {
+    return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
+}
+
+/* Whether a name leads to an open file. */
+bool has_name(int fd, const std::string &name) {
+    struct stat file = {}, named = {};
+    return fstat(fd, &file) == 0 && lstat(name.c_str(), &named) == 0 && is_same_file(file, named);
+}
+
+/* False if another program has locked the file; only without waiting. Where there are no locks, every file is taken as
+ * locked. */
+bool lock(int fd, bool wait) {
+    int how = LOCK_EX | (wait ? 0 : LOCK_NB);
+    int done = 0;
+    do
+        done = flock(fd, how);
+    while (done != 0 && errno == EINTR);
+    return done == 0 || errno != EWOULDBLOCK;
+}
+
+/* Removes a temporary file that no program has locked; waits for one that has. Nothing if it is gone. */
+void clear_away(const std::string &name, bool wait) {
+    descriptor old(open(name.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC));
+    if (!old.is_open()) {
+        require(errno == ENOENT);
+        return;
+    }
+    struct stat file = {};
+    require(fstat(old.get(), &file) == 0);
+    if (!S_ISREG(file.st_mode))
+        throw step_failed{EEXIST};
+    if (lock(old.get(), wait) && has_name(old.get(), name))
+        require(unlink(name.c_str()) == 0 || errno == ENOENT);
+}
+
+void write_all(int fd, std::string_view contents) {
+    while (!contents.empty()) {
+        ssize_t written = write(fd, contents.data(), contents.size());
+        if (written < 0 && errno == EINTR)
+            continue;
+        if (written == 0)
+            errno = ENOSPC;
+        require(written > 0);
+        contents.remove_prefix(static_cast<size_t>(written));
+    }
+}
+
+std::string directory_of(const std::string &path) {
+    size_t slash = path.rfind('/');
+    return slash == path.npos ? "" : path.substr(0, slash + 1);
+}
+
+/* The temporary file while it exists; removes itself unless it is renamed. */
+class temporary_file {
+public:
+    /* Not made if there is one already. */
+    temporary_file(std::string called, mode_t mode)
+        : name(std::move(called)), file(open(name.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, mode)) {
+        require(file.is_open() || errno == EEXIST);
+    }
+    temporary_file(const temporary_file &) = delete;
+    temporary_file &operator=(const temporary_file &) = delete;
+    ~temporary_file() {
+        if (is_locked && is_mine())
+            unlink(name.c_str());
+    }
+
+    /* False if there was one, or if another program takes this one for what a killed one has left, and removes it. */
+    bool is_made() {
+        is_locked = file.is_open() && lock(file.get(), false);
+        return is_locked && is_mine();
+    }
+    void fill(std::string_view contents, const std::optional<struct stat> &old, bool sync) const {
+        write_all(file.get(), contents);
+        if (old)
+            adopt(*old);
+        require(!sync || fsync(file.get()) == 0);
+        descriptor copy(dup(file.get())); /* some file systems report a failed write when a descriptor is closed; */
+        require(copy.is_open());          /* the file itself stays open, and so locked */
+        copy.close();
+    }
+    void rename_to(const std::string &target) const {
+        if (!is_mine())
+            throw step_failed{EEXIST};
+        require(rename(name.c_str(), target.c_str()) == 0);
+    }
+
+private:
+    bool is_mine() const {
+        return has_name(file.get(), name);
+    }
+    /* Owner first: changing it may clear bits of the mode. Not everybody may. */
+    void adopt(const struct stat &old) const {
+        constexpr mode_t MODE = 07777;
+        struct stat mine = {};
+        require(fstat(file.get(), &mine) == 0);
+        bool other = mine.st_uid != old.st_uid || mine.st_gid != old.st_gid;
+        if (other && fchown(file.get(), old.st_uid, old.st_gid) != 0) [[maybe_unused]]
+            int group_at_least = fchown(file.get(), static_cast<uid_t>(-1), old.st_gid);
+        require(fchmod(file.get(), old.st_mode & MODE) == 0);
+    }
+
+    std::string name;
+    descriptor file;
+    bool is_locked = false; /* only then may the name be removed, or given to another file */
+};
+
+/* What is to be replaced, if it exists. */
+std::optional<struct stat> existing(const std::string &target) {
+    struct stat old = {};
+    if (stat(target.c_str(), &old) != 0) {
+        require(errno == ENOENT);
+        return std::nullopt;
+    }
+    if (S_ISDIR(old.st_mode))
+        throw step_failed{EISDIR};
+    if (!S_ISREG(old.st_mode))
+        throw failure("not a regular file");
+    return old;
+}
+
+void sync_directory(const std::string &target) {
+    std::string place = directory_of(target);
+    descriptor directory(open(place.empty() ? "." : place.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+    require(directory.is_open() && fsync(directory.get()) == 0);
+}
+
+/* False if there is a temporary file already. */
+bool replaced_at_once(const std::string &target, std::string_view contents, bool sync) {
+    uninterrupted work;
+    std::optional<struct stat> old = existing(target);
+    temporary_file temporary(temporary_of(target), old ? PRIVATE_MODE : NEW_MODE);
+    if (!temporary.is_made())
+        return false;
+    temporary.fill(contents, old, sync);
+    temporary.rename_to(target);
+    return true;
+}
+
+void replace_target(const std::string &target, std::string_view contents, bool sync) {
+    for (int tries = 0; !replaced_at_once(target, contents, sync); ++tries) {
+        if (tries == MOST_TRIES)
+            throw step_failed{EEXIST};
+        clear_away(temporary_of(target), true);
+    }
+    if (sync)
+        sync_directory(target);
+}
+
+/* Enough to tell names apart that begin alike. */
+std::uint64_t hash_of(std::string_view text) {
+    std::uint64_t hash = 14695981039346656037U; /* FNV-1a */
+    for (char c : text)
+        hash = (hash ^ static_cast<unsigned char>(c)) * 1099511628211U;
+    return hash;
+}
+
+} // namespace
+
+std::string target_of(const std::string &path) {
+    std::string target = path;
+    for (int links = 0; links < MOST_LINKS; ++links) {
+        std::array<char, PATH_MAX> text;
+        ssize_t length = readlink(target.c_str(), text.data(), text.size());
+        if (length < 0 || static_cast<size_t>(length) == text.size()) /* no link; other errors show when it is opened */
+            return target;
+        std::string_view leads_to(text.data(), static_cast<size_t>(length));
+        target = (leads_to.starts_with('/') ? "" : directory_of(target)).append(leads_to);
+    }
+    throw failure(path + ": " + std::strerror(ELOOP));
+}
+
+std::string temporary_of(const std::string &target) {
+    std::string place = directory_of(target);
+    std::string name = target.substr(place.size());
+    if (name.size() + 1 + MARK.size() > NAME_MAX) {
+        std::string end = "-" + text::hex(hash_of(name));
+        name = name.substr(0, NAME_MAX - 1 - MARK.size() - end.size()) + end;
+    }
+    return place.append(".").append(name).append(MARK);
+}
+
+void remove_remains(const std::string &target) {
+    try {
+        clear_away(temporary_of(target), false);
+    } catch (const step_failed &) { /* it shows when the name is needed */
+    }
+}
+
+void replace_file(const std::string &path, std::string_view contents, const replacement_options &options) {
+    std::string target = target_of(path);
+    try {
+        replace_target(target, contents, options.sync);
+    } catch (const step_failed &step) {
+        throw failure(path + ": cannot write: " + std::strerror(step.error));
+    } catch (const failure &e) {
+        throw failure(path + ": cannot write: " + e.what());
+    }
+}
+
+} // namespace cdef

@@ -1,0 +1,99 @@
+/* Signals wait for work that they must not cut in two. */
+
+#include "cdef/support/interruption.h"
+
+#include <gtest/gtest.h>
+
+#include <csignal>
+#include <cstdlib>
+#include <sys/wait.h>
+#include <unistd.h>
+
+namespace {
+
+/* How a child process ends that does this. */
+template <class Work> int end_of(Work work) {
+    pid_t child = fork();
+    if (child == 0) {
+        work();
+        _exit(0);
+    }
+    int status = 0;
+    waitpid(child, &status, 0);
+    return status;
+}
+
+bool is_ended_by(int status, int signal) {
+    return WIFSIGNALED(status) && WTERMSIG(status) == signal;
+}
+
+/* The write end of a pipe tells that work came to its end. */
+struct Interruption : testing::Test {
+    void SetUp() override {
+        ASSERT_EQ(pipe(ends), 0);
+    }
+    void TearDown() override {
+        close(ends[0]);
+        close(ends[1]);
+    }
+    void note() const {
+        ASSERT_EQ(write(ends[1], "x", 1), 1);
+    }
+    int notes() {
+        close(ends[1]);
+        char text[16];
+        auto got = static_cast<int>(read(ends[0], text, sizeof text));
+        ends[1] = dup(ends[0]);
+        return got;
+    }
+
+    int ends[2] = {};
+};
+
+TEST_F(Interruption, WorkComesToItsEndBeforeTheProgramDoes) {
+    int status = end_of([this] {
+        {
+            cdef::uninterrupted work;
+            kill(getpid(), SIGTERM);
+            note();
+        }
+        note();
+    });
+    EXPECT_TRUE(is_ended_by(status, SIGTERM));
+    EXPECT_EQ(notes(), 1);
+}
+
+TEST_F(Interruption, SoDoesTheWorkOfThreads) {
+    int status = end_of([this] {
+        cdef::interruption_watch watch;
+        std::thread([this] {
+            cdef::uninterrupted work;
+            kill(getpid(), SIGINT);
+            usleep(20000);
+            note();
+        }).join();
+        for (;;)
+            cdef::uninterrupted more; /* until there is none */
+    });
+    EXPECT_TRUE(is_ended_by(status, SIGINT));
+    EXPECT_EQ(notes(), 1);
+}
+
+TEST_F(Interruption, IgnoredSignalsStayIgnored) {
+    int status = end_of([] {
+        signal(SIGHUP, SIG_IGN);
+        cdef::interruption_watch watch;
+        kill(getpid(), SIGHUP);
+        cdef::uninterrupted work;
+    });
+    EXPECT_EQ(status, 0);
+}
+
+TEST_F(Interruption, WatchLeavesTheMaskAsItWas) {
+    sigset_t mask;
+    { cdef::interruption_watch watch; }
+    pthread_sigmask(SIG_SETMASK, nullptr, &mask);
+    EXPECT_FALSE(sigismember(&mask, SIGTERM) || sigismember(&mask, SIGUSR2));
+}
+
+} // namespace

@@ -1,0 +1,47 @@
+/* finding_options.h: the options of subcommands that check sources, which are the same in all of them. */
+#ifndef CDGEN_CDEF_FINDING_OPTIONS_H
+#define CDGEN_CDEF_FINDING_OPTIONS_H
+
+#include "check/check.h"
+#include "report/report.h"
+
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace CLI {
+class App;
+}
+
+namespace cdef {
+
+struct finding_options {
+    std::string form;
+    std::vector<std::string> wanted;
+    std::vector<std::string> unwanted;
+    bool warnings_count = false; /* as errors do */
+    report::text_settings text = {.shown_max = 100};
+    std::string colour = "auto";
+
+    /* All warnings but the unwanted ones; a name that is given both ways is wanted. */
+    check::warning_set warnings() const;
+    /* What writes findings in the form: text to standard error, other forms to standard output. */
+    std::unique_ptr<report::writer> writer() const;
+    /* Reports a source that could not be read. why: a message that names the source. */
+    void fail_source(report::writer &to, const std::string &why) const;
+    /* Whether a source with so many findings is good. */
+    bool pass(const check::totals &count) const {
+        return count.errors == 0 && (count.warnings == 0 || !warnings_count);
+    }
+};
+
+/* Adds --format, --max, --quiet, --color, --warn, --no-warn and --werror, whose values are stored in the options; these
+ * must stay as long as the command. */
+void add_finding_options(CLI::App &command, finding_options &options);
+
+/* Throws check::cannot_check for a database, and names the subcommand that checks it. */
+void require_source(const std::string &path);
+
+} // namespace cdef
+
+#endif

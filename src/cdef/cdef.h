@@ -13,6 +13,7 @@ void add_verify(CLI::App &app, int &status);
 void add_source(CLI::App &app, int &status);
 void add_diff(CLI::App &app, int &status);
 void add_dump(CLI::App &app, int &status);
+void add_build(CLI::App &app, int &status);
 void add_check(CLI::App &app, int &status);
 void add_explain(CLI::App &app, int &status);
 

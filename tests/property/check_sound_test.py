@@ -23,7 +23,7 @@ import pytest
 
 import generate_sources
 from compare import none
-from programs import EXAMPLES, PROGRAMS, TESTS
+from programs import EXAMPLES, PROGRAMS, TESTS, environment
 
 BATCH = 100
 GROUPS = 8
@@ -121,11 +121,12 @@ def plain(text):
     return re.sub("\ufffd+", "\ufffd", text.replace("\t", " "))
 
 
-def compiled(program, paths, directory):
+def compiled(program, paths, directory, outputs=None, options=()):
     """What cdgen says about each source, by its driver: None when it compiles it."""
-    jobs = "".join(f"{path}\tout.cdef\n" for path in paths)
-    result = subprocess.run(
-        [program], input=os.fsencode(jobs), cwd=directory, stdout=subprocess.PIPE, check=True, timeout=600)
+    outputs = outputs or ["out.cdef"] * len(paths)
+    jobs = "".join("\t".join([*options, str(path), out]) + "\n" for path, out in zip(paths, outputs))
+    result = subprocess.run([program], input=os.fsencode(jobs), cwd=directory, stdout=subprocess.PIPE, check=True,
+                            timeout=600, env=environment())
     answers = [line.split(b"\t", 1) for line in result.stdout.split(b"\n")[:-1]]
     texts = [None if status == b"0" else text.removesuffix(b"\t").decode("utf-8", "replace") for status, text in answers]
     if len(texts) != len(paths):

@@ -1,0 +1,151 @@
+/* build.cpp: the subcommand that makes databases of sources. */
+
+#include "cdef/build/build.h"
+
+#include "build/dependencies.h"
+#include "cdef/build/sources.h"
+#include "cdef/build/workers.h"
+#include "cdef/cdef.h"
+#include "cdef/support/failure.h"
+#include "cdef/support/output.h"
+#include "cdef/support/replacement.h"
+
+#include <CLI/CLI.hpp>
+
+#include <algorithm>
+#include <csignal>
+#include <cstdlib>
+#include <filesystem>
+#include <map>
+#include <memory>
+#include <sys/time.h>
+#include <thread>
+#include <utility>
+
+namespace cdef {
+
+namespace {
+
+using build_command::build_run;
+using build_command::outcome;
+
+const std::map<std::string, build::byte_order> byte_orders = {{"native", build::byte_order::native},
+                                                              {"little", build::byte_order::little},
+                                                              {"big", build::byte_order::big},
+                                                              {"both", build::byte_order::both}};
+
+struct build_options {
+    std::vector<std::string> operands;
+    std::optional<std::string> file;
+    std::optional<std::string> directory;
+    std::string order = "native";
+    std::optional<std::string> timestamp;
+    std::optional<std::string> depfile;
+    unsigned jobs = std::max(1U, std::thread::hardware_concurrency());
+    bool sync = false;
+    bool list = false;
+    finding_options findings;
+};
+
+std::optional<std::string> environment(const char *name) {
+    const char *value = std::getenv(name);
+    return value == nullptr ? std::nullopt : std::optional<std::string>(value);
+}
+
+orb_timeval32_t wanted_time(const build_options &options) {
+    timeval now = {};
+    gettimeofday(&now, nullptr);
+    return build::time_of({.option = options.timestamp,
+                           .environment = environment("SOURCE_DATE_EPOCH"),
+                           .forced_empty = environment("VX_CDB_FORCE_EMPTY_TIMESTAMP").has_value()},
+                          {static_cast<vx_uint32_t>(now.tv_sec), static_cast<vx_uint32_t>(now.tv_usec)});
+}
+
+std::vector<build::unit> wanted_units(const build_options &options) {
+    return build::plan_of(build_command::sources_of(options.operands),
+                          {options.file, options.directory, byte_orders.at(options.order)});
+}
+
+void list_outputs(const std::vector<build::unit> &units) {
+    std::string names;
+    for (const build::unit &each : units)
+        for (const build::output &made : each.outputs)
+            names.append(made.path).append("\n");
+    print(names);
+}
+
+void require_no_contradiction(const build_options &options) {
+    if (options.file != "-")
+        return;
+    if (options.findings.form != "text")
+        throw failure("-o - and --format " + options.findings.form + ": both would be written to standard output");
+    if (options.depfile)
+        throw failure("-o - and --depfile: standard output has no name that could depend on anything");
+}
+
+void make_directory(const std::string &path) {
+    std::error_code error;
+    std::filesystem::create_directories(path, error);
+    if (error)
+        throw failure(path + ": " + error.message());
+}
+
+int build_all(const build_options &options) {
+    require_no_contradiction(options);
+    std::vector<build::unit> units = wanted_units(options);
+    if (options.list) {
+        list_outputs(units);
+        return OK;
+    }
+    std::string rules = options.depfile ? build::dependencies_of(units) : "";
+    signal(SIGXFSZ, SIG_IGN); /* a file that may not grow and a stream that nobody reads are errors of the call */
+    signal(SIGPIPE, SIG_IGN);
+    if (options.directory)
+        make_directory(*options.directory);
+    build_run run(units, {wanted_time(options), options.findings, options.sync});
+    build_command::do_in_order<outcome>(
+        units.size(), options.jobs, [&run](std::size_t index) { return run.make(index); },
+        [&run](std::size_t index, outcome &&made) { run.show(index, made); });
+    int status = run.finish();
+    if (status == OK && options.depfile)
+        replace_file(*options.depfile, rules);
+    return status;
+}
+
+int build_or_refuse(const build_options &options) {
+    try {
+        return build_all(options);
+    } catch (const build::wrong_request &refused) {
+        throw failure(refused.what());
+    }
+}
+
+void add_options(CLI::App &command, build_options &options) {
+    command.add_option("SOURCE", options.operands, "Source, or directory of sources (*.cdefsrc); - is standard input")
+        ->required();
+    auto *file = command.add_option("-o,--output", options.file, "The database; - is standard output");
+    command.add_option("-d,--directory", options.directory, "Put all databases into DIRECTORY")->excludes(file);
+    command.add_option("--byte-order", options.order, "native, little, big or both (NAME.le.cdef and NAME.be.cdef)")
+        ->check(CLI::IsMember(byte_orders));
+    command.add_option("--timestamp", options.timestamp,
+                       "Time in the database: none, now or SECONDS since 1970; SOURCE_DATE_EPOCH if it is set");
+    command.add_option("--depfile", options.depfile, "Write to FILE what the databases depend on, as Make reads it");
+    command.add_option("-j,--jobs", options.jobs, "Compile so many sources at once")
+        ->check(CLI::Range(1U, build_command::MOST_JOBS));
+    command.add_flag("--sync", options.sync, "Have each database on the disk before it takes its place");
+    command.add_flag("--list", options.list, "List the databases, and make none");
+    add_finding_options(command, options.findings);
+}
+
+} // namespace
+
+void add_build(CLI::App &app, int &status) {
+    auto options = std::make_shared<build_options>();
+    CLI::App *command = app.add_subcommand("build", "Checks sources and makes their databases");
+    add_options(*command, *options);
+    command->footer("Exit status: 0 if all databases are made or up to date, 1 with errors (with --werror: or "
+                    "warnings) in a source, 2 if a file cannot be read or written.");
+    command->callback([options, &status] { status = build_or_refuse(*options); });
+}
+
+} // namespace cdef

@@ -1,0 +1,36 @@
+/* progress.h: the line on a terminal that says how far a long build has come. */
+#ifndef CDGEN_CDEF_BUILD_PROGRESS_H
+#define CDGEN_CDEF_BUILD_PROGRESS_H
+
+#include <cstddef>
+#include <string>
+
+namespace cdef::build_command {
+
+/* "[3/17] name", cut to so many columns; a name cannot steer the terminal. */
+std::string progress_line(std::size_t done, std::size_t all, const std::string &name, std::size_t columns);
+
+/* Shows the line on standard error if that is a terminal that can clear it, and if there is more than one source;
+ * otherwise, does nothing. */
+class progress {
+public:
+    explicit progress(std::size_t sources);
+    progress(const progress &) = delete;
+    progress &operator=(const progress &) = delete;
+    ~progress() {
+        clear();
+    }
+
+    void show(std::size_t done, const std::string &name);
+    /* Before anything else is written. */
+    void clear();
+
+private:
+    std::size_t all;
+    bool is_wanted;
+    bool is_shown = false;
+};
+
+} // namespace cdef::build_command
+
+#endif

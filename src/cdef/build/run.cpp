@@ -1,0 +1,93 @@
+/* run.cpp: one run of the subcommand that makes databases of sources. */
+
+#include "build/compile.h"
+#include "cdef/build/build.h"
+#include "cdef/build/store.h"
+#include "cdef/support/failure.h"
+#include "cdef/support/replacement.h"
+
+#include <cstdio>
+#include <utility>
+
+namespace cdef::build_command {
+
+namespace {
+
+size_t count_of_databases(const std::vector<build::unit> &units) {
+    size_t count = 0;
+    for (const build::unit &each : units)
+        count += each.outputs.size();
+    return count;
+}
+
+/* Before anything can fail, so that what a killed build left goes away even if nothing is written. */
+void clear_remains(const build::unit &what) {
+    for (const build::output &made : what.outputs)
+        if (made.path != "-")
+            remove_remains(target_of(made.path));
+}
+
+} // namespace
+
+build_run::build_run(const std::vector<build::unit> &all, const run_options &how)
+    : units(all), options(how), wanted(how.findings.warnings()), writer(how.findings.writer()), line(all.size()),
+      databases(count_of_databases(all)) {}
+
+outcome build_run::make(size_t index) const {
+    outcome made;
+    try {
+        clear_remains(units[index]);
+        make_databases(units[index], made);
+    } catch (const check::cannot_check &unreadable) {
+        made.unreadable = unreadable.what();
+    } catch (const failure &unwritten) {
+        made.unwritten.emplace_back(unwritten.what());
+    }
+    return made;
+}
+
+void build_run::make_databases(const build::unit &what, outcome &made) const {
+    require_source(what.source);
+    build::compiled result = build::compile(
+        what, options.time, wanted, [&made](check::finding &&found) { made.findings.push_back(std::move(found)); });
+    made.count = result.count;
+    if (!options.findings.pass(made.count))
+        return;
+    for (size_t i = 0; i < what.outputs.size(); ++i) {
+        try {
+            stored how = store(result.images[i], what.outputs[i].path, what.source, options.sync);
+            ++(how == stored::WRITTEN ? made.written : made.unchanged);
+        } catch (const failure &unwritten) {
+            made.unwritten.emplace_back(unwritten.what());
+        }
+    }
+}
+
+void build_run::show(size_t index, const outcome &made) {
+    line.clear();
+    writer->begin_source(units[index].source);
+    for (const check::finding &found : made.findings)
+        writer->add(found);
+    if (made.unreadable.empty())
+        writer->end_source(made.count);
+    else
+        options.findings.fail_source(*writer, made.unreadable);
+    for (const std::string &unwritten : made.unwritten)
+        print_error(unwritten);
+    line.show(index + 1, units[index].source);
+    written += made.written;
+    unchanged += made.unchanged;
+    all_pass = all_pass && options.findings.pass(made.count);
+    no_fault = no_fault && made.unreadable.empty() && made.unwritten.empty();
+}
+
+int build_run::finish() {
+    line.clear();
+    writer->close();
+    if (units.size() > 1 && options.findings.form == "text")
+        std::fprintf(stderr, "cdef: %zu databases: %zu written, %zu unchanged, %zu not made\n", databases, written,
+                     unchanged, databases - written - unchanged);
+    return !no_fault ? FAILED : all_pass ? OK : FOUND;
+}
+
+} // namespace cdef::build_command

@@ -1,0 +1,54 @@
+/* sources.cpp: the sources that operands stand for. */
+
+#include "cdef/build/sources.h"
+
+#include "cdef/support/failure.h"
+
+#include <algorithm>
+#include <filesystem>
+#include <string_view>
+
+namespace cdef::build_command {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+constexpr std::string_view SUFFIX = ".cdefsrc";
+
+std::vector<std::string> sources_below(const std::string &directory) {
+    std::vector<std::string> found;
+    for (auto at = fs::recursive_directory_iterator(directory); at != fs::recursive_directory_iterator(); ++at) {
+        std::string name = at->path().filename().string();
+        if (name.starts_with('.'))
+            at.disable_recursion_pending();
+        else if (name.ends_with(SUFFIX) && at->is_regular_file())
+            found.push_back(at->path().string());
+    }
+    std::sort(found.begin(), found.end());
+    if (found.empty())
+        throw failure(directory + ": no sources in it (*.cdefsrc)");
+    return found;
+}
+
+} // namespace
+
+std::vector<std::string> sources_of(const std::vector<std::string> &operands) {
+    std::vector<std::string> all;
+    for (const std::string &operand : operands) {
+        std::error_code error;
+        if (operand == "-" || !fs::is_directory(operand, error)) {
+            all.push_back(operand);
+            continue;
+        }
+        try {
+            std::vector<std::string> below = sources_below(operand);
+            all.insert(all.end(), below.begin(), below.end());
+        } catch (const fs::filesystem_error &e) {
+            throw failure(operand + ": " + e.code().message());
+        }
+    }
+    return all;
+}
+
+} // namespace cdef::build_command

@@ -1,0 +1,330 @@
+"""Test what `cdef build` makes of which sources, what it says, and which requests it refuses.
+
+Every test is a function, named for what it shows. What it does when the system fails it, tests/system/builds_test.py
+shows, and that it makes what cdgen makes, tests/property/build_same_test.py.
+"""
+
+import json
+import os
+import struct
+import time
+
+import pytest
+
+from cases import BEFORE, HEAD, OUT, SOURCE, attributes, check, expect
+
+NAMELESS = HEAD.replace(b"\tName=Disk\n", b"")
+WRONG = HEAD.replace(b"Description=1", b"Descripton=1", 1)
+ODD = HEAD.replace(b"Description=1", b"Description=010", 1)
+TIME = slice(16, 24)
+
+
+def build(world, *arguments, **more):
+    """A run of cdef build, without what the environment says about times."""
+    environment = {**os.environ, "LC_ALL": "C", **more.pop("env", {})}
+    for name in ("VX_CDB_FORCE_EMPTY_TIMESTAMP", "SOURCE_DATE_EPOCH"):
+        if name not in more.get("keep", ()):
+            environment.pop(name, None)
+    environment.update(more.pop("set", {}))
+    return world.inspect("build", *arguments, env=environment, **more)
+
+
+def made(world, *arguments, **more):
+    """A run that says nothing and makes what is asked for."""
+    expect(build(world, *arguments, **more), 0)
+
+
+def sources(world, *names, text=HEAD):
+    """Sources, and their directories."""
+    for name in names:
+        world.path(name).parent.mkdir(parents=True, exist_ok=True)
+        world.write(name, text)
+
+
+def files(world, place="."):
+    """All names below a directory, sorted."""
+    top = world.path(place)
+    return sorted(str(path.relative_to(top)) for path in top.rglob("*") if not path.is_dir())
+
+
+# ---- What is made ----------------------------------------------------------------------------------------------------
+
+
+def test_makes_what_cdgen_makes(world):
+    """Byte for byte, with the class called after the output as given."""
+    for text in (HEAD + attributes(30), NAMELESS):
+        good = world.good(text)
+        for out in (OUT, "./d.cdef/x", "d.cdef/x.cdef"):
+            world.path(out).parent.mkdir(exist_ok=True)
+            expect(world.run(SOURCE, out), 0)
+            expected = world.read(out)
+            world.path(out).unlink()
+            result = build(world, "--no-warn=no-name", "-o", out, SOURCE)
+            expect(result, 0)
+            check(world.read(out) == expected, "another database", out)
+        check(len(good) > 0, "nothing compiled")
+
+
+def test_makes_each_byte_order(world):
+    """What cdgen -s makes on this machine is the other one."""
+    native, other = world.good(HEAD + attributes(3)), world.good(None, "-s")
+    little, big = (native, other) if native[8:12] == b"1tmf" else (other, native)
+    for order, expected in (("native", native), ("little", little), ("big", big)):
+        made(world, "--byte-order", order, "-o", OUT, SOURCE)
+        check(world.read() == expected, "another database in order", order)
+    made(world, "--byte-order=both", "-o", OUT, SOURCE)
+    check(world.read("out.le.cdef") == little and world.read("out.be.cdef") == big, "another pair")
+
+
+def test_calls_a_class_of_both_byte_orders_after_the_name_without_them(world):
+    """So that both are the same class."""
+    world.write(SOURCE, NAMELESS)
+    made(world, "--no-warn=no-name", "--byte-order=both", "-o", "Disk.cdef", SOURCE)
+    for name in ("Disk.le.cdef", "Disk.be.cdef"):
+        check(b"Disk\0" in world.read(name), "called otherwise in", name)
+
+
+def test_puts_databases_beside_their_sources(world):
+    """Without -o and -d."""
+    sources(world, "d/a.cdefsrc", "b.txt")
+    result = build(world, "d/a.cdefsrc", "b.txt")
+    expect(result, 0, b"cdef: 2 databases: 2 written, 0 unchanged, 0 not made\n")
+    check(world.path("d/a.cdef").exists() and world.path("b.txt.cdef").exists(), files(world))
+
+
+def test_takes_directories_for_the_sources_below_them(world):
+    """In the order of their names; hidden files and directories are left out. The output directory is made."""
+    sources(world, "in/b.cdefsrc", "in/d/a.cdefsrc", "in/.hidden/c.cdefsrc", "in/.d.cdefsrc", "in/e.txt")
+    expect(build(world, "--list", "-d", "out/more", "in"), 0, stdout=b"out/more/b.cdef\nout/more/a.cdef\n")
+    expect(build(world, "-d", "out/more", "in"), 0, b"cdef: 2 databases: 2 written, 0 unchanged, 0 not made\n")
+    check(files(world, "out") == ["more/a.cdef", "more/b.cdef"], files(world, "out"))
+
+
+def test_lists_databases_and_makes_none(world):
+    """For build systems."""
+    before = files(world)
+    expect(build(world, "--list", "--byte-order=both", "-d", "o", SOURCE), 0, stdout=b"o/class.le.cdef\no/class.be.cdef\n")
+    check(files(world) == before, files(world))
+
+
+def test_reads_standard_input_and_writes_standard_output(world):
+    """Either or both."""
+    good = world.good()
+    with open(world.path(SOURCE), "rb") as source:
+        made(world, "-o", OUT, "-", stdin=source)
+    check(world.read() == good, "another database")
+    expect(build(world, "-o", "-", SOURCE), 0, stdout=good)
+
+
+# ---- What is left alone ----------------------------------------------------------------------------------------------
+
+
+def test_leaves_the_same_database_alone(world):
+    """To the inode and the time, whatever the time in it."""
+    for first, second in ((("--timestamp=none",), ("--timestamp=now",)), (("--timestamp=7",), ()), ((), ())):
+        made(world, *first, "-o", OUT, SOURCE)
+        os.utime(world.path(OUT), (5, 5))
+        with world.left_alone():
+            made(world, *second, "-o", OUT, SOURCE)
+        world.path(OUT).unlink()
+
+
+def test_replaces_another_database(world):
+    """A new file; whoever has the old one keeps it."""
+    made(world, "-o", OUT, SOURCE)
+    old = open(world.path(OUT), "rb")
+    world.write(SOURCE, HEAD + attributes(1))
+    made(world, "-o", OUT, SOURCE)
+    check(old.read() != world.read() and os.fstat(old.fileno()).st_ino != os.stat(world.path(OUT)).st_ino, "in place")
+
+
+def test_mends_a_damaged_database(world):
+    """Also one that has the right size, and one that only its checksum damages."""
+    made(world, "-o", OUT, SOURCE)
+    good = world.read()
+    for place in (4, 100, len(good) - 1):
+        world.write(OUT, good[:place] + bytes([good[place] ^ 1]) + good[place + 1:])
+        made(world, "-o", OUT, SOURCE)
+        check(world.read() == good, "not mended at", place)
+
+
+def test_keeps_the_mode_and_follows_links(world):
+    """The link stays one."""
+    world.write("target", BEFORE)
+    os.chmod(world.path("target"), 0o640)
+    world.path(OUT).symlink_to("target")
+    made(world, "-o", OUT, SOURCE)
+    check(world.path(OUT).is_symlink() and world.read("target") == world.good(), "not written through the link")
+    check(os.stat(world.path("target")).st_mode & 0o777 == 0o640, "another mode")
+
+
+def test_leaves_the_database_of_a_wrong_source(world):
+    """And that of an odd one, if warnings count; that of another source is made."""
+    sources(world, "a.cdefsrc", text=WRONG)
+    sources(world, "b.cdefsrc", text=ODD)
+    sources(world, "c.cdefsrc")
+    for name in "ab":
+        world.write(f"{name}.cdef", BEFORE)
+    result = build(world, "--werror", *(f"{name}.cdefsrc" for name in "abc"))
+    check(result.returncode == 1, "status", result.returncode)
+    check(result.stderr.endswith(b"cdef: 3 databases: 1 written, 0 unchanged, 2 not made\n"), result.stderr)
+    check(world.read("a.cdef") == world.read("b.cdef") == BEFORE and world.path("c.cdef").exists(), files(world))
+
+
+# ---- What is said ----------------------------------------------------------------------------------------------------
+
+
+@pytest.mark.parametrize("options", [(), ("--werror",), ("--no-warn=octal",), ("--format=json",), ("--format=sarif",)])
+@pytest.mark.parametrize("text", [WRONG, ODD, HEAD])
+def test_says_what_check_says(world, options, text):
+    """The same findings in the same form, and the same status."""
+    world.write(SOURCE, text)
+    checked = world.inspect("check", *options, SOURCE)
+    expect(build(world, *options, SOURCE), checked.returncode, checked.stderr, checked.stdout)
+
+
+def test_says_the_same_however_many_at_once(world):
+    """In the order of the sources."""
+    names = [f"{number:02}.cdefsrc" for number in range(40)]
+    for number, name in enumerate(names):
+        world.write(name, (HEAD + attributes(60), WRONG, ODD)[number % 3])
+    one, four = (build(world, "-j", jobs, "-d", f"by{jobs}", *names, "missing") for jobs in "14")
+    expect(four, one.returncode, one.stderr, one.stdout)
+    check(one.returncode == 2 and files(world, "by1") == files(world, "by4"), files(world))
+    for name in files(world, "by1"):
+        check(world.read(f"by1/{name}") == world.read(f"by4/{name}"), "another database", name)
+
+
+def test_warns_of_a_class_that_is_called_after_the_database(world):
+    """Not of one with a Name; cdef check, which knows of no database, warns of neither."""
+    world.write(SOURCE, NAMELESS)
+    warning = (b"class.cdefsrc:3:1: warning: the class has no `Name`: it is called `d/x`, after the database [S601 no-name]\n"
+               b"    3 | ResourceClass\n"
+               b"      | ^~~~~~~~~~~~~\n")
+    expect(build(world, "-d", "d", "--list", SOURCE), 0, stdout=b"d/class.cdef\n")
+    world.path("d").mkdir()
+    result = build(world, "-o", "d/x.cdef", SOURCE)
+    check(result.returncode == 0 and result.stderr.startswith(warning), result.stderr)
+    check(b"d/x\0" in world.read("d/x.cdef"), "called otherwise")
+    check(world.inspect("check", "--werror", SOURCE).returncode == 0, "cdef check warns")
+
+
+def test_writes_no_nameless_class_to_standard_output(world):
+    """It has no name after which a class could be called."""
+    world.write(SOURCE, NAMELESS)
+    result = build(world, "-o", "-", SOURCE)
+    check(result.returncode == 1 and result.stdout == b"", result)
+    check(b"error: Invalid cdef out file name (must end in .cdef) [S308]\n" in result.stderr, result.stderr)
+    check(b"class.cdefsrc:3:1: note: this class has no `Name`, and is called after its database\n" in result.stderr,
+          result.stderr)
+
+
+def all_of(terminal):
+    """What has been written to a terminal that nobody has open any more."""
+    said = b""
+    try:
+        while more := os.read(terminal, 10000):
+            said += more
+    except OSError:  # how a terminal ends
+        os.close(terminal)
+    return said
+
+
+def test_shows_how_far_it_is_on_a_terminal_only(world):
+    """And clears the line in the end; a terminal that cannot is left alone."""
+    sources(world, "a.cdefsrc", "b.cdefsrc")
+    for terminal, shown in (("xterm", True), ("dumb", False)):
+        master, slave = os.openpty()
+        result = build(world, "a.cdefsrc", "b.cdefsrc", stderr=slave, set={"TERM": terminal})
+        os.close(slave)
+        said = all_of(master)
+        check(result.returncode == 0, said)
+        check((b"\r\x1b[K[1/2] a.cdefsrc" in said) == shown, said)
+        check(said.endswith(b"unchanged, 0 not made\r\n"), said)
+    result = build(world, "a.cdefsrc", "b.cdefsrc")
+    expect(result, 0, b"cdef: 2 databases: 0 written, 2 unchanged, 0 not made\n")
+
+
+# ---- The time --------------------------------------------------------------------------------------------------------
+
+
+def time_of(world):
+    """Seconds and microseconds in a little- or big-endian database of this machine."""
+    return struct.unpack("=II", world.read()[TIME])
+
+
+@pytest.mark.parametrize("options, environment, expected", [
+    ((), {}, (0, 0)),
+    ((), {"SOURCE_DATE_EPOCH": "77"}, (77, 0)),
+    (("--timestamp=none",), {"SOURCE_DATE_EPOCH": "77"}, (0, 0)),
+    (("--timestamp=4294967295",), {"SOURCE_DATE_EPOCH": "77"}, (4294967295, 0)),
+    (("--timestamp=5",), {"VX_CDB_FORCE_EMPTY_TIMESTAMP": ""}, (0, 0)),
+])
+def test_writes_the_time_that_is_asked_for(world, options, environment, expected):
+    """The option counts before the environment, and what cdgen obeys before both."""
+    made(world, *options, "-o", OUT, SOURCE, set=environment)
+    check(time_of(world) == expected, time_of(world))
+    world.verified()
+
+
+def test_writes_the_time_of_the_build(world):
+    """In seconds and microseconds."""
+    before = int(time.time())
+    made(world, "--timestamp=now", "-o", OUT, SOURCE)
+    check(before <= time_of(world)[0] <= time.time(), time_of(world))
+    world.verified()
+
+
+def test_refuses_times_that_are_none(world):
+    """Whoever gives them."""
+    wanted = b" is not none, now or seconds from 0 to 4294967295\n"
+    expect(build(world, "--timestamp=soon", SOURCE), 2, b"cdef: --timestamp: 'soon'" + wanted)
+    expect(build(world, SOURCE, set={"SOURCE_DATE_EPOCH": "4294967296"}), 2,
+           b"cdef: SOURCE_DATE_EPOCH: '4294967296' is not seconds from 0 to 4294967295\n")
+
+
+# ---- What is refused -------------------------------------------------------------------------------------------------
+
+
+@pytest.mark.parametrize("arguments, message", [
+    (("-o", "x", SOURCE, SOURCE), b"-o names one database, and there are 2 sources: use -d"),
+    (("-d", "d", "a/x.cdefsrc", "b/x.cdefsrc"), b"d/x.cdef: it would be made of a/x.cdefsrc and of b/x.cdefsrc"),
+    (("-d", "d", "-"), b"standard input has no name: name the database with -o"),
+    (("-o", "-", "--format=json", SOURCE), b"-o - and --format json: both would be written to standard output"),
+    (("-o", "-", "--depfile=x", SOURCE), b"-o - and --depfile: standard output has no name that could depend on anything"),
+    (("-o", "x", "--byte-order=both", SOURCE), b"x: with --byte-order both, the database's name must end in .cdef"),
+    (("empty",), b"empty: no sources in it (*.cdefsrc)"),
+    (("-o", SOURCE, SOURCE), b"class.cdefsrc: cannot write: it is the source"),
+    (("-o", "link", SOURCE), b"link: cannot write: it is the source"),
+    (("-o", "empty", SOURCE), b"empty: cannot write: Is a directory"),
+    (("-o", "/dev/null", SOURCE), b"/dev/null: cannot write: not a regular file"),
+    (("-o", "no/x.cdef", SOURCE), b"no/x.cdef: cannot write: No such file or directory"),
+    (("missing",), b"missing: cannot open because: No such file or directory"),
+    (("good.cdef",), b"good.cdef: a database, not a source; 'cdef verify' checks databases"),
+    (("-d", SOURCE, SOURCE), b"class.cdefsrc: Not a directory"),
+])
+def test_refuses(world, arguments, message):
+    """With a reason, status 2, and nothing written."""
+    world.good()
+    world.path("empty").mkdir()
+    world.path("link").symlink_to(SOURCE)
+    before = files(world)
+    expect(build(world, *arguments), 2, b"cdef: " + message + b"\n")
+    check(files(world) == before, files(world))
+
+
+def test_takes_names_as_they_are(world):
+    """Also such as the command line's library would take apart."""
+    for name in ("[a,b]", "a b", "-o", "\xe4\n"):
+        sources(world, f"./{name}.cdefsrc")
+        made(world, "-o", f"./{name}", f"./{name}.cdefsrc")
+        check(world.path(name).exists(), files(world))
+    made(world, "-o", "[a]", SOURCE)
+    check(world.path("[a]").exists(), files(world))
+
+
+def test_says_what_is_wrong_in_json_too(world):
+    """Of a source that cannot be read."""
+    result = build(world, "--format=json", "missing", SOURCE)
+    check(result.returncode == 2 and b"missing: cannot open" in result.stderr, result)
+    json.loads(result.stdout)

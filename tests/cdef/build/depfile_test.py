@@ -1,0 +1,138 @@
+"""Test that Make and Ninja understand what `cdef build --depfile` writes, whatever names files have.
+
+The rule of a build system names a database and knows nothing of its source; only the dependencies do. So a touched
+source makes the database anew, exactly once, if and only if the dependencies are understood.
+"""
+
+import os
+import shutil
+import subprocess
+
+import pytest
+
+from cases import HEAD, check
+
+ODD_NAMES = ["plain", "two words", "cash$", "hash#", "a:b", "back\\slash", "comma,", "~tilde", "(b)", "[a]", "\u00e4",
+             "@at", "{b}", "!"]
+# One of the two cannot read these, or reads them in another way.
+FOR_NINJA_ONLY = ["per%cent", "a=b"]
+FOR_MAKE_ONLY = ["end\\", "back\\ slash", "slash\\#", "a*", "a?", "<>", "^", "quote'", 'double"', "&"]
+
+
+def tool(name):
+    """Where a build system is."""
+    found = shutil.which(name)
+    if found is None:
+        pytest.skip(f"no {name} here")
+    return found
+
+
+def outdate(world, *names):
+    """Make files older than all others."""
+    for name in names:
+        os.utime(world.path(name), (5, 5))
+
+
+def touch(path):
+    """A time that no build system has seen, and after all others."""
+    newest = max(os.stat(other).st_mtime_ns for other in path.parent.iterdir())
+    os.utime(path, ns=(newest + 1, newest + 1))
+
+
+def run(world, *command):
+    """What a build system says."""
+    result = subprocess.run(command, capture_output=True, text=True, timeout=60, **world.options())
+    check(result.returncode == 0, *command, "says", result.stdout, result.stderr)
+    return result.stdout
+
+
+def counted(world):
+    """How many times the command of the rule was run."""
+    return len(world.path("log").read_text().splitlines())
+
+
+def project(world, name):
+    """A script that builds the class and counts its runs; the source."""
+    script = world.path("build.sh")
+    script.write_text(f'#!/bin/sh\necho run >>log\nexec {world.cdef} build --depfile=deps -o "$(cat target)" "$(cat source)"\n')
+    script.chmod(0o755)
+    source = world.path(f"{name}.cdefsrc")
+    source.write_bytes(HEAD)
+    world.path("target").write_text(f"{name}.cdef")
+    world.path("source").write_text(source.name)
+    return source
+
+
+@pytest.mark.parametrize("name", ODD_NAMES + FOR_NINJA_ONLY)
+def test_ninja_rebuilds_exactly_once_after_a_touch(world, name):
+    """The database stays as it is, and Ninja is content."""
+    source, database = project(world, name), world.path(f"{name}.cdef")
+    target = database.name.replace("$", "$$").replace(" ", "$ ").replace(":", "$:")
+    world.path("build.ninja").write_text(
+        f"rule cdef\n  command = ./build.sh\n  restat = 1\n  depfile = deps\n  deps = gcc\nbuild {target}: cdef\n")
+
+    def built():
+        run(world, tool("ninja"), "--quiet")
+        return counted(world)
+
+    check(built() == 1 and built() == 1, "not built once")
+    before = os.stat(database)
+    touch(source)
+    check(built() == 2, "not built again after a touch")
+    check(built() == 2, "built again and again after a touch")
+    after = os.stat(database)
+    check((after.st_ino, after.st_mtime_ns) == (before.st_ino, before.st_mtime_ns), "the same database was replaced")
+    source.write_bytes(HEAD.replace(b"LastKey=100", b"LastKey=101"))
+    touch(source)
+    check(built() == 3, "not built again after a change")
+    check(os.stat(database).st_ino != before.st_ino, "another database was not written")
+
+
+@pytest.mark.parametrize("name", ODD_NAMES + FOR_MAKE_ONLY)
+def test_make_rebuilds_exactly_once_after_a_change(world, name):
+    """The target is the database, and the prerequisite the source."""
+    source, database = project(world, name), world.path(f"{name}.cdef")
+    run(world, "./build.sh")
+    rule = world.path("deps").read_text().rstrip("\n")
+    world.path("Makefile").write_text(f'{rule}\n\t@echo run >>log; touch "$$(cat target)"\n')
+
+    def built():
+        run(world, tool("make"), "-s", "-r")
+        return counted(world)
+
+    outdate(world, source.name)
+    check(built() == 1, "made although the source is older")
+    outdate(world, database.name)
+    touch(source)
+    check(built() == 2 and built() == 2, "not made once although the source is newer")
+    source.unlink()
+    failed = subprocess.run([tool("make"), "-r"], capture_output=True, text=True, timeout=60, **world.options())
+    check(failed.returncode == 2 and f"No rule to make target '{source.name}'" in failed.stderr, failed.stderr)
+
+
+def test_has_a_rule_for_each_source(world):
+    """With both databases of a source on one side."""
+    for name in "ab":
+        world.write(f"{name}.cdefsrc", HEAD)
+    result = world.inspect("build", "--depfile=deps", "--byte-order=both", "-d", "o", "a.cdefsrc", "b.cdefsrc")
+    check(result.returncode == 0, result)
+    check(world.path("deps").read_text() ==
+          "o/a.le.cdef o/a.be.cdef: a.cdefsrc\no/b.le.cdef o/b.be.cdef: b.cdefsrc\n", world.path("deps").read_text())
+
+
+def test_is_not_written_if_a_database_is_not_made(world):
+    """Or a build system would take the failed one for a finished one."""
+    world.write("deps", b"old")
+    world.write("a.cdefsrc", b"ControlDefinition\n")
+    check(world.inspect("build", "--depfile=deps", "a.cdefsrc").returncode == 1, "no error")
+    check(world.read("deps") == b"old", "written")
+
+
+@pytest.mark.parametrize("name", ["a\nb", "a;b", "a|b"])
+def test_refuses_names_that_no_rule_can_have(world, name):
+    """Before anything is made."""
+    world.write(f"{name}.cdefsrc", HEAD)
+    result = world.inspect("build", "--depfile=deps", f"{name}.cdefsrc")
+    message = b"cdef: --depfile: Make cannot read a name with a newline, a semicolon or a bar\n"
+    check((result.returncode, result.stderr) == (2, message), result)
+    check(not world.path(f"{name}.cdef").exists(), "made")

@@ -1,43 +1,78 @@
-# cdgen_compile(TARGET SOURCE OUTPUT [BYTE_ORDER big|little] [NO_TIMESTAMP])
+# cdgen_compile(TARGET SOURCE OUTPUT [BYTE_ORDER native|little|big|both] [NO_TIMESTAMP] [WERROR])
 #
-# Compiles the class definition SOURCE into the database OUTPUT as part of the build. Relative paths count from the
-# current source and the current binary directory. TARGET is made if it does not exist and then belongs to "all";
-# an existing one, of several databases or a program that needs them, waits for the database.
+# Builds the database OUTPUT of the class definition SOURCE with "cdef build", which shows every error and warning, and
+# replaces the database in one step. Relative paths count from the current source and the current binary directory.
+# TARGET is made if it does not exist and then belongs to "all"; an existing one, of several databases or a program that
+# needs them, waits for the database.
 #
-#   BYTE_ORDER    of the machine that will read the database; the one of the machine that builds if left out
+#   BYTE_ORDER    of the machines that will read the database; that of the machine that builds if left out. With both,
+#                 OUTPUT NAME.cdef stands for NAME.le.cdef and NAME.be.cdef
 #   NO_TIMESTAMP  the database has no time of building: equal sources then make equal files
+#   WERROR        a source with warnings makes no database
 #
-# The database is made anew when the source or cdgen has changed. If the source is at fault, what was there stays.
+# The database is made anew when the source or cdef has changed. If the source is at fault, what was there stays.
 
 function(cdgen_compile TARGET SOURCE OUTPUT)
-  cmake_parse_arguments(PARSE_ARGV 3 arg "NO_TIMESTAMP" "BYTE_ORDER" "")
+  cmake_parse_arguments(PARSE_ARGV 3 arg "NO_TIMESTAMP;WERROR" "BYTE_ORDER" "")
   if(DEFINED arg_UNPARSED_ARGUMENTS OR DEFINED arg_KEYWORDS_MISSING_VALUES)
     message(FATAL_ERROR "cdgen_compile: cannot read \"${arg_UNPARSED_ARGUMENTS}${arg_KEYWORDS_MISSING_VALUES}\"")
   endif()
-  if(DEFINED arg_BYTE_ORDER AND NOT arg_BYTE_ORDER MATCHES "^(big|little)$")
-    message(FATAL_ERROR "cdgen_compile: BYTE_ORDER is big or little, not \"${arg_BYTE_ORDER}\"")
+  if(NOT DEFINED arg_BYTE_ORDER)
+    set(arg_BYTE_ORDER native)
+  elseif(NOT arg_BYTE_ORDER MATCHES "^(native|little|big|both)$")
+    message(FATAL_ERROR "cdgen_compile: BYTE_ORDER is native, little, big or both, not \"${arg_BYTE_ORDER}\"")
+  endif()
+  if(NOT TARGET cdgen::cdef)
+    message(FATAL_ERROR "cdgen_compile: this cdgen was installed without cdef, which builds databases")
   endif()
   cmake_path(ABSOLUTE_PATH SOURCE BASE_DIRECTORY "${CMAKE_CURRENT_SOURCE_DIR}" NORMALIZE)
   cmake_path(ABSOLUTE_PATH OUTPUT BASE_DIRECTORY "${CMAKE_CURRENT_BINARY_DIR}" NORMALIZE)
   cmake_path(RELATIVE_PATH OUTPUT BASE_DIRECTORY "${CMAKE_BINARY_DIR}" OUTPUT_VARIABLE shown)
+  cmake_path(GET OUTPUT PARENT_PATH place)
+  cmake_path(GET OUTPUT FILENAME name)
 
-  set(script "${CMAKE_CURRENT_FUNCTION_LIST_DIR}/cdgenRun.cmake")
-  add_custom_command(OUTPUT "${OUTPUT}"
-    COMMAND "${CMAKE_COMMAND}" "-DCDGEN=$<TARGET_FILE:cdgen::cdgen>" "-DSOURCE=${SOURCE}" "-DOUTPUT=${OUTPUT}"
-      "-DBYTE_ORDER=${arg_BYTE_ORDER}" "-DNO_TIMESTAMP=${arg_NO_TIMESTAMP}" -P "${script}"
-    DEPENDS "${SOURCE}" "$<TARGET_FILE:cdgen::cdgen>" "${script}"
-    COMMENT "Compiling class definition ${shown}"
+  set(databases "${OUTPUT}")
+  if(arg_BYTE_ORDER STREQUAL "both")
+    string(REGEX REPLACE "\\.cdef$" "" base "${OUTPUT}")
+    set(databases "${base}.le.cdef" "${base}.be.cdef")
+  endif()
+  set(time now)
+  if(arg_NO_TIMESTAMP)
+    set(time none)
+  endif()
+  set(options "--output=${name}" "--byte-order=${arg_BYTE_ORDER}" "--timestamp=${time}")
+  if(arg_WERROR)
+    list(APPEND options --werror)
+  endif()
+
+  # Names that differ in what a target's name cannot hold (a-b, a_b) differ in the hash.
+  string(MD5 hash "${shown}")
+  string(SUBSTRING "${hash}" 0 8 hash)
+
+  # A database that comes out as it was keeps its time. Ninja looks at it again after the command if the command has
+  # byproducts, and here a stamp is one. Other build systems go by times alone.
+  set(stamp "${CMAKE_CURRENT_BINARY_DIR}/CMakeFiles/cdgen_${hash}.stamp")
+  if(CMAKE_GENERATOR MATCHES "Ninja")
+    set(restat BYPRODUCTS "${stamp}" COMMAND "${CMAKE_COMMAND}" -E touch "${stamp}")
+  else()
+    set(restat COMMAND "${CMAKE_COMMAND}" -E touch_nocreate ${databases})
+  endif()
+
+  # A class without a Name is called after the output as the command line has it, which is the bare name.
+  add_custom_command(OUTPUT ${databases}
+    COMMAND "${CMAKE_COMMAND}" -E make_directory "${place}"
+    COMMAND "${CMAKE_COMMAND}" -E chdir "${place}" "$<TARGET_FILE:cdgen::cdef>" build ${options} -- "${SOURCE}"
+    ${restat}
+    DEPENDS "${SOURCE}" "$<TARGET_FILE:cdgen::cdef>"
+    COMMENT "Building class definition ${shown}"
     VERBATIM)
 
-  # One target for each database: with two, a parallel make would run the command in both. Names that differ in what a
-  # target's name cannot hold (a-b, a_b) differ in the hash.
+  # One target for each database: with two, a parallel make would run the command in both.
   if(NOT TARGET "${TARGET}")
-    add_custom_target("${TARGET}" ALL DEPENDS "${OUTPUT}")
+    add_custom_target("${TARGET}" ALL DEPENDS ${databases})
   else()
-    string(MD5 hash "${shown}")
-    string(SUBSTRING "${hash}" 0 8 hash)
     string(MAKE_C_IDENTIFIER "${TARGET}_${shown}_${hash}" part)
-    add_custom_target("${part}" DEPENDS "${OUTPUT}")
+    add_custom_target("${part}" DEPENDS ${databases})
     add_dependencies("${TARGET}" "${part}")
   endif()
 endfunction()

@@ -22,7 +22,7 @@ configure_package_config_file(cmake/cdgenConfig.cmake.in cdgenConfig.cmake INSTA
 write_basic_package_version_file(cdgenConfigVersion.cmake COMPATIBILITY SameMinorVersion)
 install(EXPORT cdgenTargets NAMESPACE cdgen:: DESTINATION "${package_dir}" COMPONENT development)
 install(FILES "${CMAKE_CURRENT_BINARY_DIR}/cdgenConfig.cmake" "${CMAKE_CURRENT_BINARY_DIR}/cdgenConfigVersion.cmake"
-  cmake/cdgenCompile.cmake cmake/cdgenRun.cmake DESTINATION "${package_dir}" COMPONENT development)
+  cmake/cdgenCompile.cmake DESTINATION "${package_dir}" COMPONENT development)
 
 # For pkg-config. Paths count from the file itself, unless a directory was asked for that is outside the prefix.
 function(pc_path variable directory)

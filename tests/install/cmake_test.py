@@ -39,16 +39,16 @@ class Trial(Case):
         return (self.here / "b" / name).read_bytes()
 
     def leftovers(self):
-        return [str(path) for path in (self.here / "b").rglob(".cdgen-*")]
+        return [str(path) for path in (self.here / "b").rglob(".*cdef-new")]
 
 
 class Compile:
     """What holds with every generator."""
 
     def test_class_without_name_is_called_after_the_bare_output(self):
-        self.project("cdgen_compile(disk a.cdefsrc deep/er/Disk.cdef)", a=disk().read_bytes())
+        self.project("cdgen_compile(disk a.cdefsrc deep/er/Tape.cdef)", a=disk().read_bytes().replace(b"\tName=Disk\n", b""))
         self.build()
-        self.assertIn(b"\0Disk\0", self.made("deep/er/Disk.cdef"))
+        self.assertIn(b"\0Tape\0", self.made("deep/er/Tape.cdef"))
         self.assertEqual(self.leftovers(), [])
 
     def test_changed_source_is_compiled_again(self):
@@ -67,49 +67,64 @@ class Compile:
         self.assertEqual((self.here / "b/a.cdef").stat().st_ino, before.st_ino)
 
     def project_with_a_tree_of_its_own(self):
-        """A project that uses a copy of the installed tree; returns the compiler in it."""
+        """A project that uses a copy of the installed tree; returns the program in it that makes databases."""
         copy = self.here / "tree"
         shutil.copytree(tree(), copy, symlinks=True)
         (self.here / "a.cdefsrc").write_bytes(disk().read_bytes())
         (self.here / "CMakeLists.txt").write_text(HEAD + "cdgen_compile(disk a.cdefsrc a.cdef)")
         run("cmake", "-G", self.GENERATOR, "-S", self.here, "-B", self.here / "b", found_in(copy))
-        return copy / "bin/cdgen"
+        return copy / "bin/cdef"
 
     def test_changed_compiler_compiles_again(self):
         compiler = self.project_with_a_tree_of_its_own()
         self.build()
-        before = (self.here / "b/a.cdef").stat()
+        real = compiler.rename(compiler.with_name("real"))
+        compiler.write_text(f'#!/bin/sh\necho run >>"{self.here}/log"\nexec "{real}" "$@"\n')
+        compiler.chmod(0o755)
         later(compiler)
         self.build()
-        self.assertNotEqual((self.here / "b/a.cdef").stat().st_ino, before.st_ino)
+        self.assertEqual((self.here / "log").read_text(), "run\n")
 
     def test_failure_leaves_no_target(self):
         self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=b"ControlDefinition\n\tFileVersoin=1\n")
         with self.assertRaises(AssertionError) as failed:
             self.build()
-        self.assertIn(f"{self.here}/a.cdefsrc:2: error: Attribute name not defined in table", str(failed.exception))
+        self.assertIn(f"{self.here}/a.cdefsrc:2:2: error: Attribute name not defined in table", str(failed.exception))
         self.assertFalse((self.here / "b/a.cdef").exists())
         self.assertEqual(self.leftovers(), [])
 
-    def test_failure_shows_all_that_cdgen_says(self):
-        """Some of its messages have a part on standard output."""
-        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=b"ControlDefinition\n\tFileVersion=\n")
+    def test_every_error_and_warning_is_shown(self):
+        wrong = disk().read_bytes().replace(b"Id=0", b"Id=010").replace(b"FirstKey", b"FistKey")
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=wrong.replace(b"UInt32", b"Uint32"))
         with self.assertRaises(AssertionError) as failed:
             self.build()
-        self.assertRegex(str(failed.exception), r"In file .*a\.cdefsrc: *\n.*:2: error: Missing attribute value: ")
+        for said in (r":17:5: warning: .*octal", r":18:11: error: Invalid data type", r":34:2: error: Attribute name not"):
+            self.assertRegex(str(failed.exception), f"{self.here}/a.cdefsrc{said}")
+
+    def test_warnings_are_shown_and_counted_on_request(self):
+        odd = disk().read_bytes().replace(b"Id=0", b"Id=010")
+        self.project("cdgen_compile(odd a.cdefsrc a.cdef)", a=odd)
+        self.assertIn(f"{self.here}/a.cdefsrc:17:5: warning: ", self.build())
+        self.project("cdgen_compile(odd a.cdefsrc strict.cdef WERROR)", a=odd)
+        self.assertRaises(AssertionError, self.build)
+        self.assertFalse((self.here / "b/strict.cdef").exists())
 
     def test_what_a_killed_build_left_behind_is_cleared(self):
-        compiler = self.project_with_a_tree_of_its_own()
-        real = compiler.rename(compiler.with_name("real"))
-        compiler.write_text("#!/bin/sh\nfor to; do :; done\nprintf half >\"$to\"\nkill -9 $PPID\n")
-        compiler.chmod(0o755)
-        self.assertRaises(AssertionError, self.build)
-        (left,) = (self.here / "b").rglob(".cdgen-*")
-        self.assertEqual((left / "a.cdef").read_bytes(), b"half")
-        real.replace(compiler)
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=disk().read_bytes())
+        (self.here / "b/.a.cdef.cdef-new").write_bytes(b"half")
         self.build()
         self.assertEqual(self.leftovers(), [])
         self.assertIn(b"BlockSize", self.made("a.cdef"))
+
+    def test_touched_source_is_compiled_once(self):
+        """The database keeps its inode, and the build system is content."""
+        self.project_with_a_tree_of_its_own()
+        self.build()
+        before = (self.here / "b/a.cdef").stat()
+        os.utime(self.here / "a.cdefsrc")
+        said = [self.build() for _ in range(2)]
+        self.assertEqual(["Building class definition" in each for each in said], [True, False])
+        self.assertEqual((self.here / "b/a.cdef").stat().st_ino, before.st_ino)
 
     def test_names_that_a_target_cannot_tell_apart(self):
         names = ("a-b.cdef", "a_b.cdef", "a b.cdef", "a/b.cdef")
@@ -131,7 +146,7 @@ class Compile:
         self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=disk().read_bytes().split(b"ClassToManagerMapping")[0])
         with self.assertRaises(AssertionError) as failed:
             self.build()
-        self.assertIn(f"{self.here}/a.cdefsrc: error: No class-to-manager maps defined", str(failed.exception))
+        self.assertRegex(str(failed.exception), f"{self.here}/a.cdefsrc:[0-9]+: error: No class-to-manager maps defined")
         self.assertFalse((self.here / "b/a.cdef").exists())
 
     def test_byte_order_is_the_one_asked_for(self):
@@ -139,6 +154,14 @@ class Compile:
                      "cdgen_compile(both a.cdefsrc big.cdef BYTE_ORDER big)", a=disk().read_bytes())
         self.build()
         self.assertEqual((self.made("little.cdef")[8:12], self.made("big.cdef")[8:12]), (LITTLE, BIG))
+
+    def test_both_byte_orders_are_of_one_class(self):
+        self.project("cdgen_compile(disk a.cdefsrc deep/Tape.cdef BYTE_ORDER both)",
+                     a=disk().read_bytes().replace(b"\tName=Disk\n", b""))
+        self.build()
+        for name, order in (("deep/Tape.le.cdef", LITTLE), ("deep/Tape.be.cdef", BIG)):
+            self.assertEqual(self.made(name)[8:12], order)
+            self.assertIn(b"Tape\0", self.made(name))
 
     def test_time_of_building_is_left_out_on_request(self):
         self.project("cdgen_compile(with a.cdefsrc with.cdef BYTE_ORDER little)\n"

@@ -21,7 +21,8 @@ def classes(directory, count, attributes):
     """Sources of so many classes, each with so many attributes, and a Makefile for them."""
     text = "".join(generate.source(attributes=attributes))
     for number in range(count):
-        (directory / f"c{number}.cdefsrc").write_text(text)
+        own = text.replace("Class_100000", f"Class_{100000 + number}").replace("mgr1.cat", f"mgr{number}.cat")
+        (directory / f"c{number}.cdefsrc").write_text(own)
     (directory / "Makefile").write_text("SUFFIXES :=\nall: $(patsubst %.cdefsrc,%.cdef,$(wildcard *.cdefsrc))\n"
                                         "%.cdef: %.cdefsrc\n\t$(CDGEN) $< $@\n")
 

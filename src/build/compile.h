@@ -2,6 +2,7 @@
 #ifndef CDGEN_BUILD_COMPILE_H
 #define CDGEN_BUILD_COMPILE_H
 
+#include "build/across.h"
 #include "build/plan.h"
 #include "check/check.h"
 
@@ -14,6 +15,7 @@ struct compiled {
     check::totals count;
     /* The database for each output of the unit, in their order; empty if there are errors. */
     std::vector<std::vector<std::byte>> images;
+    class_facts facts; /* none if there are errors */
 };
 
 /* Gives the findings to `to`, as check_file does. Throws check::cannot_check. Nothing is written. */

@@ -101,7 +101,7 @@ void source_check::finish() {
     if (job == nullptr || found.errors() > 0)
         return;
     try {
-        job->finish(compiler);
+        job->finish(compiler, see);
     } catch (const fatal_exit &failure) {
         throw cannot_check(std::string(compiler.name()) + ": " + text_of(failure));
     }

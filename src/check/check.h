@@ -15,6 +15,8 @@ class stepwise_compiler;
 
 namespace check {
 
+struct view;
+
 /* ---- Warnings (warnings/registry.cpp) --------------------------------------------------------------------------- */
 
 /* In the order of the codes. */
@@ -57,6 +59,10 @@ enum warning_id {
     OUTER_BLANK,
     UNBALANCED,
     NO_NAME,
+    SHARED_NAME,
+    SHARED_KEYS,
+    OTHER_MANAGER,
+    OTHER_VARIABLE_CLASS,
     WARNING_COUNT
 };
 
@@ -139,8 +145,8 @@ struct cannot_check : std::runtime_error {
 struct compile_job {
     /* A class without a Name is called after this file, to which nothing is written. */
     std::string output;
-    /* Is given the compilation, all steps of which have been taken, of a source without errors. */
-    std::function<void(stepwise_compiler &)> finish;
+    /* Is given the compilation, all steps of which have been taken, of a source without errors, and the check. */
+    std::function<void(stepwise_compiler &, const view &)> finish;
 };
 
 /* Checks a source that is in memory. Its name appears in cannot_check only, which is thrown if memory

@@ -105,7 +105,7 @@ int build_all(const build_options &options) {
     build_run run(units, {wanted_time(options), options.findings, options.sync});
     build_command::do_in_order<outcome>(
         units.size(), options.jobs, [&run](std::size_t index) { return run.make(index); },
-        [&run](std::size_t index, outcome &&made) { run.show(index, made); });
+        [&run](std::size_t index, outcome &&made) { run.show(index, std::move(made)); });
     int status = run.finish();
     if (status == OK && options.depfile)
         replace_file(*options.depfile, rules);

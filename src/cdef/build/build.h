@@ -2,6 +2,7 @@
 #ifndef CDGEN_CDEF_BUILD_BUILD_H
 #define CDGEN_CDEF_BUILD_BUILD_H
 
+#include "build/across.h"
 #include "build/plan.h"
 #include "cdef/build/progress.h"
 #include "cdef/support/finding_options.h"
@@ -24,6 +25,7 @@ struct run_options {
 struct outcome {
     std::vector<check::finding> findings;
     check::totals count;
+    build::class_facts facts;
     std::string unreadable;             /* why the source could not be read; empty if it could */
     std::vector<std::string> unwritten; /* why databases could not be written */
     size_t written = 0;                 /* databases */
@@ -37,7 +39,7 @@ public:
     /* Compiles a source and writes its databases; several threads may do so at once. */
     outcome make(size_t index) const;
     /* Shows what was found in a source; to be called in order, by one thread. */
-    void show(size_t index, const outcome &made);
+    void show(size_t index, outcome &&made);
     /* Shows a summary of many sources. Returns the exit status. */
     int finish();
 
@@ -47,6 +49,7 @@ private:
     const std::vector<build::unit> &units;
     run_options options;
     check::warning_set wanted;
+    build::class_family family;
     std::unique_ptr<report::writer> writer;
     progress line;
     size_t databases = 0, written = 0, unchanged = 0;

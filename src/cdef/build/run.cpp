@@ -30,8 +30,8 @@ void clear_remains(const build::unit &what) {
 } // namespace
 
 build_run::build_run(const std::vector<build::unit> &all, const run_options &how)
-    : units(all), options(how), wanted(how.findings.warnings()), writer(how.findings.writer()), line(all.size()),
-      databases(count_of_databases(all)) {}
+    : units(all), options(how), wanted(how.findings.warnings()), family(wanted), writer(how.findings.writer()),
+      line(all.size()), databases(count_of_databases(all)) {}
 
 outcome build_run::make(size_t index) const {
     outcome made;
@@ -51,6 +51,7 @@ void build_run::make_databases(const build::unit &what, outcome &made) const {
     build::compiled result = build::compile(
         what, options.time, wanted, [&made](check::finding &&found) { made.findings.push_back(std::move(found)); });
     made.count = result.count;
+    made.facts = std::move(result.facts);
     if (!options.findings.pass(made.count))
         return;
     for (size_t i = 0; i < what.outputs.size(); ++i) {
@@ -63,7 +64,12 @@ void build_run::make_databases(const build::unit &what, outcome &made) const {
     }
 }
 
-void build_run::show(size_t index, const outcome &made) {
+/* What other classes say of this one comes after what it says of itself. Its database has been written meanwhile. */
+void build_run::show(size_t index, outcome &&made) {
+    for (check::finding &found : family.add(units[index].source, made.facts)) {
+        made.findings.push_back(std::move(found));
+        ++made.count.warnings;
+    }
     line.clear();
     writer->begin_source(units[index].source);
     for (const check::finding &found : made.findings)

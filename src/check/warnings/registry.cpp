@@ -23,6 +23,11 @@ maker make_carriage_return, make_class_bit, make_comma_list, make_comment_in_val
 
 namespace {
 
+/* Warnings about several classes, which no check of one source can report. */
+made_watcher make_nothing(const watcher_setup &setup) {
+    return make<watcher>(setup);
+}
+
 struct row {
     warning known;
     maker *make;
@@ -217,6 +222,24 @@ constexpr row rows[] = {
       "Only `cdef build` reports it, because it knows the database.",
       "Give the `ResourceClass` a `Name`."},
      make_no_name},
+    {{SHARED_NAME, "S611", "shared-name", "two classes have one name",
+      "Two classes that are built together have the same name.", "Give one of them another name."},
+     make_nothing},
+    {{SHARED_KEYS, "S612", "shared-keys", "the keys of two classes overlap",
+      "Two classes that are built together have the same `MessageCatalog`, and there are keys that are at least their "
+      "`FirstKey` and at most their `LastKey`.",
+      "Give each class keys of its own."},
+     make_nothing},
+    {{OTHER_MANAGER, "S613", "other-manager", "a message catalog has two managers",
+      "Two classes that are built together have the same `MessageCatalog`, and different `ResourceManager`s.",
+      "Correct the name of one of them."},
+     make_nothing},
+    {{OTHER_VARIABLE_CLASS, "S614", "other-variable-class", "two variable classes of one name differ",
+      "Two classes that are built together have a `ResourceVariableClass` of the same name, with different intervals "
+      "or "
+      "aliases.",
+      "Make them alike, or give one of them another name."},
+     make_nothing},
 };
 
 constexpr std::array<warning, WARNING_COUNT> by_id() {

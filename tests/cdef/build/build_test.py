@@ -34,11 +34,16 @@ def made(world, *arguments, **more):
     expect(build(world, *arguments, **more), 0)
 
 
+def of_its_own(number, text=HEAD):
+    """A class with a name and a message catalog that no other number has."""
+    return text.replace(b"Name=Disk", b"Name=Disk%d" % number).replace(b"mgr1.cat", b"mgr%d.cat" % number)
+
+
 def sources(world, *names, text=HEAD):
-    """Sources, and their directories."""
-    for name in names:
+    """Sources of different classes, and their directories."""
+    for number, name in enumerate(names):
         world.path(name).parent.mkdir(parents=True, exist_ok=True)
-        world.write(name, text)
+        world.write(name, of_its_own(number, text))
 
 
 def files(world, place="."):
@@ -187,7 +192,7 @@ def test_says_the_same_however_many_at_once(world):
     """In the order of the sources."""
     names = [f"{number:02}.cdefsrc" for number in range(40)]
     for number, name in enumerate(names):
-        world.write(name, (HEAD + attributes(60), WRONG, ODD)[number % 3])
+        world.write(name, of_its_own(number // 2, (HEAD + attributes(60), WRONG, ODD)[number % 3]))
     one, four = (build(world, "-j", jobs, "-d", f"by{jobs}", *names, "missing") for jobs in "14")
     expect(four, one.returncode, one.stderr, one.stdout)
     check(one.returncode == 2 and files(world, "by1") == files(world, "by4"), files(world))
@@ -228,6 +233,24 @@ def all_of(terminal):
     except OSError:  # how a terminal ends
         os.close(terminal)
     return said
+
+
+def test_warns_of_classes_that_contradict_each_other(world):
+    """Each is right alone. Both databases are made all the same; with --werror, the status says so."""
+    world.write("a.cdefsrc", HEAD)
+    world.write("b.cdefsrc", HEAD.replace(b"FirstKey=1\n", b"FirstKey=50\n"))
+    said = (b"b.cdefsrc:3: warning: the class `Disk` is also in a.cdefsrc:3 [S611 shared-name]\n"
+            b"b.cdefsrc:12:11: warning: the keys 50 to 100 overlap 1 to 100 in a.cdefsrc:12, which has the message catalog "
+            b"`mgr1.cat` too [S612 shared-keys]\n"
+            b"   12 | \tFirstKey=50\n"
+            b"      | \t         ^~\n")
+    expect(build(world, "a.cdefsrc", "b.cdefsrc"), 0, said + b"cdef: 2 databases: 2 written, 0 unchanged, 0 not made\n")
+    strict = build(world, "--werror", "--no-warn=S611", "a.cdefsrc", "b.cdefsrc")
+    check(strict.returncode == 1 and b"S611" not in strict.stderr and b"S612" in strict.stderr, strict)
+    expect(build(world, "--werror", "--no-warn=shared-name", "--no-warn=shared-keys", "a.cdefsrc", "b.cdefsrc"), 0,
+           b"cdef: 2 databases: 0 written, 2 unchanged, 0 not made\n")
+    for source in ("a.cdefsrc", "b.cdefsrc"):
+        expect(world.inspect("check", "--werror", source), 0)
 
 
 def test_shows_how_far_it_is_on_a_terminal_only(world):

@@ -22,7 +22,7 @@ const std::string SOURCE = "ControlDefinition\n\tFileVersion=1\n"
 /* The image of a class, in both byte orders, with a time. */
 struct both {
     explicit both(orb_timeval32_t time) {
-        auto finish = [&](stepwise_compiler &compiler) {
+        auto finish = [&](stepwise_compiler &compiler, const check::view &) {
             native = compiler.image();
             build::set_time(native, time);
             reversed = compiler.reversed(native);

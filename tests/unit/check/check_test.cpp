@@ -65,7 +65,7 @@ const std::string NAMELESS = CLASS.substr(0, CLASS.find("\tName=Pump\n")) + CLAS
 
 TEST(Compile, MakesTheDatabaseInBothByteOrders) {
     std::string native, reversed;
-    check::compile_job job = {"Out.cdef", [&](stepwise_compiler &compiler) {
+    check::compile_job job = {"Out.cdef", [&](stepwise_compiler &compiler, const check::view &) {
                                   std::vector<std::byte> image = compiler.image();
                                   native = text_of(image);
                                   reversed = text_of(compiler.reversed(std::move(image)));
@@ -82,7 +82,8 @@ TEST(Compile, MakesTheDatabaseInBothByteOrders) {
 /* What is found if a source is compiled to an output; with the output's bytes, if there are any. */
 codes compiled(const std::string &source, const std::string &output, std::string &image) {
     codes found;
-    check::compile_job job = {output, [&](stepwise_compiler &compiler) { image = text_of(compiler.image()); }};
+    check::compile_job job = {
+        output, [&](stepwise_compiler &compiler, const check::view &) { image = text_of(compiler.image()); }};
     check::check_bytes(
         source, "x", found_in::all_warnings(),
         [&](check::finding &&each) { found.push_back(found_in::shown(each) + " " + each.text); }, &job);

@@ -90,7 +90,7 @@ void build_run::show(size_t index, outcome &&made) {
 int build_run::finish() {
     line.clear();
     writer->close();
-    if (units.size() > 1 && options.findings.form == "text")
+    if (units.size() > 1 && options.findings.form == "text" && !options.findings.text.quiet)
         std::fprintf(stderr, "cdef: %zu databases: %zu written, %zu unchanged, %zu not made\n", databases, written,
                      unchanged, databases - written - unchanged);
     return !no_fault ? FAILED : all_pass ? OK : FOUND;

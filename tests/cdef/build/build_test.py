@@ -243,7 +243,8 @@ def test_warns_of_classes_that_contradict_each_other(world):
             b"b.cdefsrc:12:11: warning: the keys 50 to 100 overlap 1 to 100 in a.cdefsrc:12, which has the message catalog "
             b"`mgr1.cat` too [S612 shared-keys]\n"
             b"   12 | \tFirstKey=50\n"
-            b"      | \t         ^~\n")
+            b"      | \t         ^~\n"
+            b"0 errors and 2 warnings in 1 of 2 sources\n")
     expect(build(world, "a.cdefsrc", "b.cdefsrc"), 0, said + b"cdef: 2 databases: 2 written, 0 unchanged, 0 not made\n")
     strict = build(world, "--werror", "--no-warn=S611", "a.cdefsrc", "b.cdefsrc")
     check(strict.returncode == 1 and b"S611" not in strict.stderr and b"S612" in strict.stderr, strict)

@@ -9,6 +9,7 @@
 
 #include <map>
 #include <numeric>
+#include <set>
 #include <tuple>
 
 namespace cdb {
@@ -61,11 +62,11 @@ std::string shown(const bytes &file, std::size_t offset, std::size_t size) {
 
 /* What the file has where a repair corrected it: a number, or one byte of something longer. */
 region corrected_region(const repair &repaired) {
+    std::size_t offset = repaired.offset();
     std::vector<region> all = regions(repaired.corrected());
-    region at =
-        *std::find_if(all.begin(), all.end(), [&](const region &r) { return repaired.offset() - r.offset < r.size; });
+    region at = *std::find_if(all.begin(), all.end(), [&](const region &r) { return offset - r.offset < r.size; });
     if (at.size > sizeof(std::uint64_t)) {
-        at.offset = repaired.offset();
+        at.offset = offset;
         at.size = 1;
     }
     return at;
@@ -94,10 +95,11 @@ std::vector<diagnosed> caused_by_one(const database &db, std::vector<finding> &&
     if (cause == found.end())
         cause = found.insert(found.begin(), contradicted(db, repaired, at));
     auto first = static_cast<std::size_t>(cause - found.begin());
-    std::vector<finding> stay = verify(repaired.corrected());
+    std::set<decltype(key_of(found.front()))> stay;
+    verify(repaired.corrected(), [&](finding &&f) { stay.insert(key_of(f)); });
     std::vector<std::size_t> causes(found.size(), first);
     for (std::size_t i = 0; i < found.size(); ++i)
-        if (std::any_of(stay.begin(), stay.end(), [&](const finding &f) { return key_of(f) == key_of(found[i]); }))
+        if (stay.contains(key_of(found[i])))
             causes[i] = i;
     return arranged(std::move(found), causes);
 }

@@ -243,7 +243,7 @@ bool repair::try_words_near(const finding &f) {
 }
 
 bool repair::succeeds() {
-    if (copy.empty())
+    if (copy.empty() || (only_sum_is_wrong && findings.size() > NEAR)) /* each trial would make all warnings again */
         return false;
     if (try_header())
         return true;

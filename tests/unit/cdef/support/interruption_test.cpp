@@ -11,10 +11,13 @@
 
 namespace {
 
-/* How a child process ends that does this. */
+/* How a child process ends that does this. The signals are not ignored there, though they may be here, as they are in
+ * the background of a shell. */
 template <class Work> int end_of(Work work) {
     pid_t child = fork();
     if (child == 0) {
+        for (int number : {SIGHUP, SIGINT, SIGTERM})
+            signal(number, SIG_DFL);
         work();
         _exit(0);
     }

@@ -129,7 +129,11 @@ struct made_watcher {
 };
 
 template <class Warning> made_watcher make(const watcher_setup &setup) {
-    return {std::make_unique<Warning>(setup), events_of<Warning>(), types_of<Warning>()};
+    made_watcher made;
+    made.warning = std::make_unique<Warning>(setup);
+    made.events = events_of<Warning>();
+    made.types = types_of<Warning>();
+    return made;
 }
 
 /* Each warning's file ends with one. */

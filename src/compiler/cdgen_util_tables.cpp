@@ -109,9 +109,8 @@ bool take_reserved(tbl &t, size_t needed) {
     char *block = reserve(needed, &capacity);
     if (block == nullptr)
         return false;
-    size_t used = t.used();
-    if (used > 0)
-        memcpy(block, t.tbl_base, used);
+    if (t.tbl_base != nullptr)
+        memcpy(block, t.tbl_base, t.used());
     t.release();
     t.tbl_base = block;
     t.tbl_owner = memory_owner::RESERVED;

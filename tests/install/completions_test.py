@@ -115,7 +115,7 @@ class Zsh(Shell):
     def completed(self, line):
         """The words after a tab."""
         setup = ("autoload -Uz compinit; compinit -u -D; PS1= PS2=; unsetopt zle_bracketed_paste automenu; "
-                 "LISTMAX=1000; zstyle ':completion:*' list-prompt ''; "
+                 "LISTMAX=1000; "
                  f"fake() {{ print -r -- \"GOT${{(j:|:)@}}END\" }}; {line.split()[0]}() {{ fake \"$@\" }}")
         place = only("share/zsh/*/_cdef").parent
         (self.here / ".zshrc").write_text(f"fpath=('{place}' $fpath)\n{setup}\nprint READY\n")

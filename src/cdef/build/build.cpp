@@ -9,6 +9,7 @@
 #include "cdef/support/failure.h"
 #include "cdef/support/output.h"
 #include "cdef/support/replacement.h"
+#include "cdef/support/status.h"
 
 #include <CLI/CLI.hpp>
 
@@ -143,8 +144,7 @@ void add_build(CLI::App &app, int &status) {
     auto options = std::make_shared<build_options>();
     CLI::App *command = app.add_subcommand("build", "Checks sources and makes their databases");
     add_options(*command, *options);
-    command->footer("Exit status: 0 if all databases are made or up to date, 1 with errors (with --werror: or "
-                    "warnings) in a source, 2 if a file cannot be read or written.");
+    command->footer(status_help("build"));
     command->callback([options, &status] { status = build_or_refuse(*options); });
 }
 

@@ -71,9 +71,7 @@ void add_check(CLI::App &app, int &status) {
     add_finding_options(*command, options->findings);
     CLI::Option *fix = command->add_flag("--fix", options->fixes, "Correct what is surely meant otherwise");
     command->add_flag("--dry-run", options->changes_nothing, "Show as a diff what --fix would change")->needs(fix);
-    command->footer(
-        "Exit status: 0 without errors, 1 with errors (with --werror: or warnings), 2 if a source cannot be "
-        "read.");
+    command->footer(status_help("check"));
     command->callback([options, &status] { status = check_all(*options); });
 }
 

@@ -341,8 +341,7 @@ void add_diff(CLI::App &app, int &status) {
         ->check(check_level)
         ->option_text("[=LEVEL:{readers,clients,stored}]");
     add_forms(*command, options->form, {"text", "json"}, "Form of the differences: text or json");
-    command->footer("Exit status: 0 if they are the same (with --compat: if B can take the place of A), 1 if not, 2 if "
-                    "a database cannot be read.");
+    command->footer(status_help("diff"));
     command->callback([options, &status] { status = diff(*options); });
 }
 

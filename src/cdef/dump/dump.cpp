@@ -45,7 +45,7 @@ void add_dump(CLI::App &app, int &status) {
               "Form of what is shown: text, json, or hex: every byte and what it is, even of a damaged file");
     add_colour(*command, options->colour);
     command->add_flag("--offsets", options->with_offsets, "Also show the offset of each record and list");
-    command->footer("Exit status: 0 if the database is shown, 2 if it cannot be shown.");
+    command->footer(status_help("dump"));
     command->callback([options, &status] {
         run(*options);
         status = OK;

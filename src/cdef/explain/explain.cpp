@@ -147,7 +147,7 @@ void add_explain(CLI::App &app, int &status) {
     command->add_option("CODE", options->codes,
                         "Code such as S101 or CDB104, or a warning's name; without one, all are listed");
     add_forms(*command, options->form, {"text", "json"}, "Form: text or json");
-    command->footer("Exit status: 0; 2 if there is no such code, or on failure.");
+    command->footer(status_help("explain"));
     command->callback([options, &status] { status = explain(*options); });
 }
 

@@ -51,7 +51,7 @@ void add_source(CLI::App &app, int &status) {
     CLI::App *command =
         app.add_subcommand("source", "Writes a source that compiles to a database with the same meaning");
     command->add_option("FILE", *path, "Database to turn into a source; - is standard input")->required();
-    command->footer("Exit status: 0 if the source is written, 2 if the database has none.");
+    command->footer(status_help("source"));
     command->callback([path, &status] { status = run(*path); });
 }
 

@@ -2,16 +2,12 @@
 #ifndef CDGEN_CDEF_FAILURE_H
 #define CDGEN_CDEF_FAILURE_H
 
+#include "cdef/support/status.h"
+
 #include <stdexcept>
 #include <string>
 
 namespace cdef {
-
-/* Exit statuses. Each subcommand says what 0 and 1 mean; FAILED is the same for all: a file cannot be read or written,
- * it makes no sense, or the program was called wrongly. */
-constexpr int OK = 0;
-constexpr int FOUND = 1;
-constexpr int FAILED = 2;
 
 /* Ends a subcommand. The program reports it and returns FAILED. */
 struct failure : std::runtime_error {

@@ -147,8 +147,7 @@ void add_verify(CLI::App &app, int &status) {
     command->add_flag("--all", options->shows_all, "Show the findings that follow from others too");
     command->add_flag("--werror", options->warnings_count, "Count warnings as errors");
     command->add_flag("-q,--quiet", options->quiet, "Show errors only");
-    command->footer("Exit status: 0 without errors, 1 with errors (with --werror: or warnings), 2 if a file cannot be "
-                    "read.");
+    command->footer(status_help("verify"));
     command->callback([options, &status] { status = run(*options); });
 }
 

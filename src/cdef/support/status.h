@@ -1,0 +1,52 @@
+/* status.h: what the exit statuses of the subcommands mean. docs/cdef.md has the same table. */
+#ifndef CDGEN_CDEF_STATUS_H
+#define CDGEN_CDEF_STATUS_H
+
+#include <array>
+#include <string>
+#include <string_view>
+
+namespace cdef {
+
+constexpr int OK = 0;
+constexpr int FOUND = 1;
+constexpr int FAILED = 2;
+
+struct meanings {
+    std::string_view subcommand;
+    std::string_view ok;
+    std::string_view found; /* empty: does not occur */
+    std::string_view failed;
+};
+
+/* FAILED also stands for a wrong command line and for output that cannot be written. */
+inline constexpr std::array<meanings, 7> statuses = {{
+    {"verify", "no errors", "errors, or warnings with --werror", "a file cannot be read, or is a text"},
+    {"dump", "the database is shown", "", "the database cannot be read, or is not sound (--hex shows it then too)"},
+    {"diff", "no difference (with --compat: B can take the place of A)", "differences (with --compat: it cannot)",
+     "a database cannot be read, is not sound, or is too entangled"},
+    {"source", "the source is written", "", "the database cannot be read, or no source gives it back"},
+    {"check", "no errors", "errors, or warnings with --werror", "a source cannot be read, or is a database"},
+    {"build", "all databases are made or up to date",
+     "errors, or warnings with --werror; the databases of the other sources are made",
+     "a file cannot be read or written; the other databases are made"},
+    {"explain", "the codes are explained", "", "there is no such code"},
+}};
+
+/* "Exit status: 0: ...; 1: ...; 2: ...", the end of a subcommand's help. */
+inline std::string status_help(std::string_view subcommand) {
+    std::string text;
+    for (const meanings &row : statuses) {
+        if (row.subcommand != subcommand)
+            continue;
+        text.append("Exit status: 0: ").append(row.ok);
+        if (!row.found.empty())
+            text.append("; 1: ").append(row.found);
+        text.append("; 2: ").append(row.failed);
+    }
+    return text;
+}
+
+} // namespace cdef
+
+#endif

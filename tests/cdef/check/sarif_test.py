@@ -76,6 +76,73 @@ class Logs(unittest.TestCase):
         self.assertTrue(place["artifactLocation"]["uri"].endswith("/a%20b%3A%25%C3%A4%23%3F.cdefsrc"))
 
 
+class Properties(unittest.TestCase):
+    """What consumers do with a log."""
+
+    def run_on(self, text, name="a.cdefsrc"):
+        """The run of a log about a text, and the directory's name in it."""
+        with tempfile.TemporaryDirectory() as directory:
+            source = pathlib.Path(directory) / name
+            source.write_bytes(text)
+            (run,) = check("sarif", source)["runs"]
+        return run, directory
+
+    def test_absolute_and_relative_paths(self):
+        run, directory = self.run_on(b"Nonsense\n")
+        uri = run["results"][0]["locations"][0]["physicalLocation"]["artifactLocation"]["uri"]
+        self.assertEqual(uri, f"file://{directory}/a.cdefsrc")
+        (run,) = check("sarif", "keys.cdefsrc")["runs"]
+        uri = run["results"][0]["locations"][0]["physicalLocation"]["artifactLocation"]["uri"]
+        self.assertEqual(uri, "keys.cdefsrc")
+
+    def test_rules_explain_themselves(self):
+        rules = check("sarif", "sound.cdefsrc")["runs"][0]["tool"]["driver"]["rules"]
+        (octal,) = (rule for rule in rules if rule["id"] == "S509")
+        self.assertEqual(octal["name"], "octal")
+        self.assertIn("A leading 0 makes a number octal", octal["fullDescription"]["text"])
+        self.assertIn("Remove the 0", octal["help"]["text"])
+        self.assertEqual(octal["defaultConfiguration"], {"level": "warning"})
+        self.assertEqual(len({rule["id"] for rule in rules}), len(rules))
+
+    def test_results_know_their_rules(self):
+        (run,) = check("sarif", "numbers.cdefsrc", "keys.cdefsrc")["runs"]
+        rules = [rule["id"] for rule in run["tool"]["driver"]["rules"]]
+        self.assertEqual([rules[result["ruleIndex"]] for result in run["results"]],
+                         [result["ruleId"] for result in run["results"]])
+
+    def test_fixes_cure(self):
+        text = (CASES / "disk.cdefsrc").read_bytes()
+        run, _ = self.run_on(text)
+        lines = text.decode().splitlines(keepends=True)
+        for result in run["results"]:
+            (change,) = result["fixes"][0]["artifactChanges"]
+            (replacement,) = change["replacements"]
+            region = replacement["deletedRegion"]
+            self.assertEqual(region["startLine"], region["endLine"])
+            line = lines[region["startLine"] - 1]
+            lines[region["startLine"] - 1] = (
+                line[:region["startColumn"] - 1] + replacement["insertedContent"]["text"] + line[region["endColumn"] - 1:])
+        self.assertEqual(len(run["results"]), 2)
+        run, _ = self.run_on("".join(lines).encode())
+        self.assertEqual(run["results"], [])
+
+    def test_fingerprints_survive_moved_lines(self):
+        text = (CASES / "disk.cdefsrc").read_bytes() + b"Nonsense\nNonsense\n"
+        before, after = ([result["partialFingerprints"]["primaryLocationLineHash"] for result in self.run_on(each)[0]["results"]]
+                         for each in (text, b"# a comment\n\n" + text))
+        self.assertEqual(before, after)
+        self.assertEqual(len(set(before)), len(before))
+
+    def test_sources_that_cannot_be_read(self):
+        (invocation,) = check("sarif", "keys.cdefsrc", "missing", ".")["runs"][0]["invocations"]
+        self.assertFalse(invocation["executionSuccessful"])
+        said = [(each["message"]["text"], each["locations"][0]["physicalLocation"]["artifactLocation"]["uri"])
+                for each in invocation["toolExecutionNotifications"]]
+        self.assertEqual(said, [("missing: cannot open because: No such file or directory", "missing"),
+                                (".: cannot read because: Is a directory", ".")])
+        self.assertEqual(check("sarif", "keys.cdefsrc")["runs"][0]["invocations"], [{"executionSuccessful": True}])
+
+
 class Schema(unittest.TestCase):
     """What the schema refuses."""
 

@@ -78,7 +78,7 @@ TEST(diagnosis, a_wrong_count_is_the_cause_of_everything_that_it_displaces) {
     std::memcpy(image.data() + at, &count, sizeof count);
     for (bool sum_is_right : {false, true}) {
         if (sum_is_right)
-            image[CHECKSUM + (std::endian::native == std::endian::little ? 0 : 1)] ^= std::byte{2 ^ 3};
+            image[CHECKSUM + (std::endian::native == std::endian::little ? 0 : 1)] ^= std::byte{2} ^ std::byte{3};
         std::vector<cdb::diagnosed> all = cdb::diagnose(cdb::database(image));
         ASSERT_GT(all.size(), 3U);
         EXPECT_EQ(all[0].found.broken->code, cdb::CODE_CONTRADICTING);

@@ -82,7 +82,7 @@ TEST_F(Replacement, LeavesTheOldFileToWhoHasItOpen) {
 }
 
 TEST_F(Replacement, KeepsTheMode) {
-    for (mode_t wanted : {0600, 0444, 0755}) {
+    for (mode_t wanted : {mode_t{0600}, mode_t{0444}, mode_t{0755}}) {
         write("a.cdef", "old");
         fs::permissions(here / "a.cdef", static_cast<fs::perms>(wanted));
         replace_file(path("a.cdef"), "new");

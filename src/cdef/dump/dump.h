@@ -3,57 +3,26 @@
 #ifndef CDGEN_CDEF_DUMP_H
 #define CDGEN_CDEF_DUMP_H
 
+#include "cdef/support/facts.h"
 #include "cdef/support/input.h"
 #include "format/records.h"
 
 #include <array>
-#include <variant>
 
 namespace cdef::dump {
 
 /* ---- Facts ----------------------------------------------------------------------------------------------------- */
 
-struct none {};
-
-/* One of our own words: the name of a type, a version, a time. */
-struct word {
-    std::string text;
-};
-
-/* A set of words, perhaps empty. */
-struct words {
-    std::vector<std::string> list;
-};
-
-/* Text from the file: any bytes. */
-struct any_text {
-    std::string_view bytes;
-};
-
-struct binary {
-    std::span<const std::byte> bytes;
-};
-
-/* A number that reads best in hexadecimal. */
-struct bits {
-    std::uint32_t number;
-};
-
-/* A number that stands for something with a name; kind is empty if it stands for nothing known. */
-struct named {
-    std::uint32_t number;
-    std::string_view kind;
-    std::string_view name;
-};
-
-/* found and expected are empty if it is correct. */
-struct checksum {
-    std::string found;
-    std::string expected;
-};
-
-using fact = std::variant<none, std::int64_t, std::uint64_t, float, double, bits, word, words, any_text, binary,
-                          vx_resource_handle_t, named, checksum>;
+using facts::any_text;
+using facts::binary;
+using facts::bits;
+using facts::checksum;
+using facts::fact;
+using facts::fact_of;
+using facts::named;
+using facts::none;
+using facts::word;
+using facts::words;
 
 /* As the listing shows it, on one line and free of bytes that a terminal would act upon. */
 std::string as_text(const fact &f);
@@ -63,14 +32,8 @@ std::string as_text(const fact &f);
 /* The number in a field of an area. */
 std::uint32_t number_in(const cdb::bytes &area, std::size_t at, const cdb::field &f);
 
-/* What it means as far as it can be told from the number alone. */
-fact fact_of(cdb::meaning as, std::uint32_t number);
-
 /* The data type that a record names for its values; VX_UNKNOWN if it names none. */
 vx_data_type_t data_type_in(const cdb::record_format &format, const cdb::bytes &area, std::size_t at);
-
-/* A value that stands in its cell, or is none. */
-fact fact_of(const cdb::value &value);
 
 /* Of the list table that a reference leads into; not for other targets. */
 const cdb::bytes &lists_of(const cdb::class_tables &tables, cdb::target to);

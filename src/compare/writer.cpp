@@ -25,18 +25,20 @@ void append_to(std::string &text, std::string_view piece) {
 
 } // namespace
 
-writer::writer(std::size_t size, taker to) : left(size * TIMES_SIZE + AT_LEAST), take(std::move(to)) {}
+allowance::allowance(std::size_t size) : left(size * TIMES_SIZE + AT_LEAST) {}
 
-void writer::spend(std::size_t amount) {
-    if (amount <= LINE)
+void allowance::spend(std::size_t length) {
+    if (length <= LINE)
         return;
-    if (amount > left)
+    if (length > left)
         throw too_entangled("values or texts that lead to the same place too often");
-    left -= amount;
+    left -= length;
 }
 
+writer::writer(std::size_t size, taker to) : left(size), take(std::move(to)) {}
+
 void writer::write_text(std::string_view text) {
-    spend(text.size());
+    left.spend(text.size());
     take("'");
     for (; !text.empty(); text.remove_prefix(std::min(PORTION, text.size())))
         take(text::escaped_ascii(text.substr(0, PORTION)));
@@ -44,7 +46,7 @@ void writer::write_text(std::string_view text) {
 }
 
 void writer::write_bytes(std::string_view bytes) {
-    spend(bytes.size());
+    left.spend(bytes.size());
     take("0x");
     for (; !bytes.empty(); bytes.remove_prefix(std::min(PORTION, bytes.size())))
         take(text::hex_of(std::as_bytes(std::span(bytes.substr(0, PORTION)))));

@@ -16,11 +16,24 @@ struct too_entangled : std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
-/* Writes values as a person reads them: 5, 0.1, 'text', 0x0102, [1, 2], {Int32 0}, nothing, misplaced 5.
+/* How much may be written about databases.
  *
  * In a database that was compiled each long text has one owner, so all of them together are no larger than the file. In
- * one made by hand, many references may lead to one text, and a long name may have many parts. So what is written is
- * counted: beyond a limit, every function throws too_entangled. */
+ * one made by hand, many references may lead to one text, and a long name may have many parts. */
+class allowance {
+public:
+    /* size: of the databases together, in bytes. */
+    explicit allowance(std::size_t size);
+
+    /* Counts a long text. Throws too_entangled where it exceeds what is left. length: in bytes. */
+    void spend(std::size_t length);
+
+private:
+    std::size_t left;
+};
+
+/* Writes values as a person reads them: 5, 0.1, 'text', 0x0102, [1, 2], {Int32 0}, nothing, misplaced 5. Functions
+ * throw too_entangled beyond an allowance. */
 class writer {
 public:
     using taker = std::function<void(std::string_view)>;
@@ -41,9 +54,8 @@ private:
     void write_bytes(std::string_view bytes);
     void write_elements(const owned_value &value, std::size_t count);
     void write_valid_value(const node &n);
-    void spend(std::size_t amount);
 
-    std::size_t left;
+    allowance left;
     taker take;
 };
 

@@ -1,13 +1,13 @@
 /* diff.cpp: what differs between two databases, and for whom it matters. */
 
 #include "cdef/cdef.h"
+#include "cdef/diff/document.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/forms.h"
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
 #include "compare/compare.h"
 #include "compare/writer.h"
-#include "report/json_writer.h"
 
 #include <CLI/CLI.hpp>
 
@@ -20,7 +20,6 @@ namespace {
 
 using compare::change;
 using compare::difference;
-using compare::node;
 using compare::node_kind;
 
 struct diff_options {
@@ -69,27 +68,13 @@ private:
 
 /* ---- Forms ----------------------------------------------------------------------------------------------------- */
 
-const char *name_of(change what) {
-    switch (what) {
-    case change::REMOVED:
-        return "removed";
-    case change::ADDED:
-        return "added";
-    case change::RENAMED:
-        return "renamed";
-    case change::CHANGED:
-        break;
-    }
-    return "changed";
-}
-
 char sign_of(change what) {
     return what == change::REMOVED ? '-' : what == change::ADDED ? '+' : '~';
 }
 
 /* Rules that a difference breaks, as far as somebody asked for them. */
-std::vector<const compare::breach_rule *> rules_broken(const difference &d, compare::level up_to) {
-    std::vector<const compare::breach_rule *> rules;
+diff::reasons rules_broken(const difference &d, compare::level up_to) {
+    diff::reasons rules;
     for (compare::breach b : d.broken)
         if (const compare::breach_rule &rule = compare::rule_of(b); rule.broken_for <= up_to)
             rules.push_back(&rule);
@@ -102,10 +87,13 @@ public:
     lines(held_output &to, std::size_t size, bool has_one_class)
         : out(to), writer(size, [&to](std::string_view piece) { to.take(piece); }), one_class(has_one_class) {}
 
-    void begin() {}
+    /* Standard error has the mentions. */
+    void begin(const std::string & /* before */, const std::string & /* after */) {}
+    void mention_version(const difference & /* d */) {}
+    void mention_order(std::endian /* before */, std::endian /* after */) {}
     void end() {}
 
-    void add(const difference &d, const std::vector<const compare::breach_rule *> &reasons) {
+    void add(const difference &d, const diff::reasons &why) {
         out.take(std::string{sign_of(d.what), ' '});
         write_path(d);
         if (d.what == change::RENAMED) {
@@ -114,9 +102,9 @@ public:
         }
         if (d.what == change::CHANGED)
             write_change(d);
-        for (const compare::breach_rule *rule : reasons)
-            out.take(std::string(rule == reasons.front() ? " (" : "; ").append(rule->reason));
-        out.take(reasons.empty() ? "\n" : ")\n");
+        for (const compare::breach_rule *rule : why)
+            out.take(std::string(rule == why.front() ? " (" : "; ").append(rule->reason));
+        out.take(why.empty() ? "\n" : ")\n");
     }
 
 private:
@@ -144,86 +132,6 @@ private:
     held_output &out;
     compare::writer writer;
     bool one_class;
-};
-
-/* Differences as JSON. */
-class document {
-public:
-    document(held_output &out, std::size_t size, const diff_options &compared)
-        : to([&out](std::string_view piece) { out.take(piece); }),
-          writer(size, [this](std::string_view piece) { text += piece; }), options(compared) {}
-    document(const document &) = delete;
-    document &operator=(const document &) = delete;
-
-    void begin() {
-        to.open_object();
-        to.add_schema("cdef-diff.schema.json", 1);
-        to.add_text("before", options.before);
-        to.add_text("after", options.after);
-        to.open_list("differences");
-    }
-    void end() {
-        to.close();
-        to.close();
-    }
-
-    void add(const difference &d, const std::vector<const compare::breach_rule *> &reasons) {
-        to.open_object();
-        to.add_text("change", name_of(d.what));
-        add_path(d);
-        if (d.what == change::RENAMED)
-            add_name("name", *d.renamed_to);
-        if (d.what == change::CHANGED) {
-            to.add_text("field", d.before->what->field);
-            add_fact("before", *d.before);
-            add_fact("after", *d.after);
-        }
-        if (!reasons.empty())
-            add_reasons(reasons);
-        to.close();
-    }
-
-private:
-    void add_name(std::string_view key, const node &n) {
-        text.clear();
-        writer.write_name(n);
-        to.add_text(key, text);
-    }
-
-    void add_fact(std::string_view key, const compare::fact &f) {
-        text.clear();
-        writer.write_fact(f);
-        to.add_text(key, text);
-    }
-
-    /* The first node is the database. */
-    void add_path(const difference &d) {
-        to.open_list("path");
-        for (const node *n : d.path.subspan(1)) {
-            to.open_object();
-            to.add_text("kind", n->label());
-            add_name("name", *n);
-            to.close();
-        }
-        to.close();
-    }
-
-    void add_reasons(const std::vector<const compare::breach_rule *> &reasons) {
-        to.open_list("breaks");
-        for (const compare::breach_rule *rule : reasons) {
-            to.open_object();
-            to.add_text("code", rule->code);
-            to.add_text("level", compare::name_of(rule->broken_for));
-            to.add_text("reason", rule->reason);
-            to.close();
-        }
-        to.close();
-    }
-
-    report::json_writer to;
-    std::string text;
-    compare::writer writer;
-    const diff_options &options;
 };
 
 /* ---- The comparison -------------------------------------------------------------------------------------------- */
@@ -277,10 +185,12 @@ template <class Form>
 outcome write_differences(const compared &before, const compared &after, const diff_options &options, Form &form) {
     outcome came;
     compare::level up_to = level_of(options.compat).value_or(compare::level::STORED);
-    form.begin();
+    form.begin(options.before, options.after);
     compare::compare(before.origin(), after.origin(), [&](const difference &d) {
-        if (d.what == change::CHANGED && is_lower_version(*d.before, *d.after))
+        if (d.what == change::CHANGED && is_lower_version(*d.before, *d.after)) {
             came.mentions.push_back(mention_of_version(d, before, after));
+            form.mention_version(d);
+        }
         auto reasons = rules_broken(d, up_to);
         if (!options.compat.empty() && reasons.empty())
             return;
@@ -289,16 +199,18 @@ outcome write_differences(const compared &before, const compared &after, const d
             reasons.clear();
         form.add(d, reasons);
     });
-    form.end();
-    if (before.in.db.order() != after.in.db.order())
+    if (before.in.db.order() != after.in.db.order()) {
         came.mentions.push_back(mention_of_order(before, after));
+        form.mention_order(before.in.db.order(), after.in.db.order());
+    }
+    form.end();
     return came;
 }
 
 outcome write_to(held_output &out, const compared &before, const compared &after, const diff_options &options) {
     std::size_t size = before.in.contents.size() + after.in.contents.size();
     if (options.form == "json") {
-        document form(out, size, options);
+        diff::document form([&out](std::string_view piece) { out.take(piece); }, size);
         return write_differences(before, after, options, form);
     }
     lines form(out, size, before.has_one_class() && after.has_one_class());
@@ -306,7 +218,7 @@ outcome write_to(held_output &out, const compared &before, const compared &after
 }
 
 /* What a long comparison writes is not kept; once it is known that there is an end, it is made again. */
-int diff(const diff_options &options) {
+int run(const diff_options &options) {
     if (options.before == "-" && options.after == "-")
         throw failure("only one of the two can be standard input");
     compared before(options.before), after(options.after);
@@ -342,7 +254,7 @@ void add_diff(CLI::App &app, int &status) {
         ->option_text("[=LEVEL:{readers,clients,stored}]");
     add_forms(*command, options->form, {"text", "json"}, "Form of the differences: text or json");
     command->footer(status_help("diff"));
-    command->callback([options, &status] { status = diff(*options); });
+    command->callback([options, &status] { status = run(*options); });
 }
 
 } // namespace cdef

@@ -24,16 +24,18 @@ import pathlib
 import subprocess
 import sys
 
+import jsonschema
 import pytest
 
 import cdb_image
 import make_images
 from compare import same
 from expectation import Expectation
-from programs import PROGRAMS, TESTS
+from programs import PROGRAMS, PROJECT, TESTS
 
 CASES = TESTS / "cdef" / "diff"
 BLOCKS = ("replace", "with", "diff", "compat", "clients", "stored")
+SCHEMA = jsonschema.Draft7Validator(json.loads((PROJECT / "schema/cdef-diff.schema.json").read_text()))
 TIMEOUT = 60
 TURNED = {"-": "+", "+": "-"}
 
@@ -350,8 +352,9 @@ def test_places_in_a_class_hash_are_not_compared(programs):
 def differences_in(text):
     """Those of a document in JSON."""
     data = json.loads(text)
-    same(list(data), ["schema", "version", "before", "after", "differences"], "members")
-    same((data["schema"], data["version"]), ("cdef-diff.schema.json", 1), "schema")
+    same([f"{each.json_path}: {each.message}" for each in SCHEMA.iter_errors(data)], [], "against the schema")
+    same(list(data), ["schema", "version", "before", "after", "differences", "mentions"], "members")
+    same((data["schema"], data["version"]), ("cdef-diff.schema.json", 2), "schema")
     return data["differences"]
 
 
@@ -360,18 +363,18 @@ def test_json_says_the_same(programs):
     one = programs.compile(class_source(attribute("A", 1), attribute("B", 2), head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(attribute("A", 3), head="\tName=C\n"), "two.cdef")
     status, text, _ = programs.diff("--json", one, two)
-    path = [{"kind": "ResourceClass", "name": "'C'"}]
+    path = [{"kind": "ResourceClass", "name": "C"}]
     changed = {
         "change": "changed",
-        "path": [*path, {"kind": "PersistentResourceAttribute", "name": "'A'"}],
+        "path": [*path, {"kind": "PersistentResourceAttribute", "name": "A"}],
         "field": "ra_attr_id",
-        "before": "1",
-        "after": "3",
+        "before": 1,
+        "after": 3,
         "breaks": [{"code": "CMP102", "level": "readers", "reason": "readers know it by its number"}],
     }
     removed = {
         "change": "removed",
-        "path": [*path, {"kind": "PersistentResourceAttribute", "name": "'B'"}],
+        "path": [*path, {"kind": "PersistentResourceAttribute", "name": "B"}],
         "breaks": [{"code": "CMP101", "level": "readers", "reason": "readers miss it"}],
     }
     same((status, differences_in(text)), (1, [changed, removed]), "different")
@@ -385,11 +388,90 @@ def test_json_of_what_is_new_and_of_the_database(programs):
     one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(attribute("A", 1), head="\tName=C\n"), "two.cdef")
     programs.patch(two, 12, b"\7")
-    path = [{"kind": "ResourceClass", "name": "'C'"}, {"kind": "PersistentResourceAttribute", "name": "'A'"}]
+    path = [{"kind": "ResourceClass", "name": "C"}, {"kind": "PersistentResourceAttribute", "name": "A"}]
     status, text, _ = programs.diff("--json", one, two)
     sequence = int.from_bytes([7, 0, 0, 0], sys.byteorder)
-    changed = {"change": "changed", "path": [], "field": "cdb_hdr_seqno", "before": "0", "after": str(sequence)}
+    changed = {"change": "changed", "path": [], "field": "cdb_hdr_seqno", "before": 0, "after": sequence}
     same((status, differences_in(text)), (1, [changed, {"change": "added", "path": path}]), "diff")
+
+
+def changed_values(programs, before, after):
+    """What becomes of fields when lines take the place of others: by field, the values with their types, if they have any."""
+    head = "\tName=C\n"
+    one, two = (programs.compile(class_source(attribute("A", 1, *lines[1:], datatype=lines[0]), head=head), name)
+                for lines, name in ((before, "one.cdef"), (after, "two.cdef")))
+    found = differences_in(programs.diff("--json", one, two)[1])
+    return {each["field"]: [each.get(key) for key in ("before_type", "before", "after_type", "after")] for each in found}
+
+
+# Lines before and after, a field, and its values: a type and a value each.
+TYPED = [
+    (["Int32", "DefaultValue=-5"], ["Int32", "DefaultValue=7"], "ra_dflt_value", ["Int32", -5, "Int32", 7]),
+    (["UInt64", "DefaultValue=18446744073709551615"], ["UInt64", "DefaultValue=1"], "ra_dflt_value",
+     ["UInt64", 18446744073709551615, "UInt64", 1]),
+    (["Float32", "DefaultValue=0.1"], ["Float32", "DefaultValue=inf"], "ra_dflt_value", ["Float32", 0.1, "Float32", "inf"]),
+    (["String"], ["String", "DefaultValue=it's"], "ra_dflt_value", ["String", "", "String", "it's"]),
+    (["String", "DefaultValue=0x41"], ["Binary", "DefaultValue=0x41"], "ra_dflt_value",
+     ["String", "0x41", "Binary", {"bytes": "41"}]),
+    (["Int32Array", "DefaultValue=1", "DefaultValue=2"], ["Int32Array", "DefaultValue=1"], "ra_dflt_value",
+     ["Int32Array", [1, 2], "Int32Array", [1]]),
+    (["Int32", "Properties=Public"], ["Int32", "Properties=Public,OptForDefine"], "ra_props",
+     [None, ["InvalForDefine", "Public"], None, ["OptForDefine", "Public"]]),
+    (["Int32"], ["Int32", "GroupID=4", "GroupName=9"], "ra_group_id", [None, None, None, 4]),
+    (["Int32"], ["UInt32"], "ra_data_type", [None, "Int32", None, "UInt32"]),
+]
+
+
+@pytest.mark.parametrize("before, after, field, values", TYPED)
+def test_values_in_json_have_types(programs, before, after, field, values):
+    """Numbers are numbers, and so on; nothing is null."""
+    same(changed_values(programs, before, after)[field], values, field)
+
+
+def test_entries_in_json_are_values_or_intervals(programs):
+    """Valid values as the attribute's type has them, and varieties."""
+    gone = class_source(attribute("A", 1), head="\tName=C\n")
+    given = attribute("A", 1, "VarietyRange=4,5", "ValidValue=-3", "ValidValue=7,9")
+    one = programs.compile(gone, "one.cdef")
+    two = programs.compile(class_source(given, head="\tName=C\n"), "two.cdef")
+    found = [each["path"][-1] for each in differences_in(programs.diff("--json", one, two)[1])]
+    same(found, [{"kind": "variety", "name": {"low": 4, "high": 5}}, {"kind": "valid value", "name": -3},
+                 {"kind": "valid value", "name": {"low": 7, "high": 9}}], "entries")
+
+
+def test_structures_in_json(programs):
+    """Each element has its type."""
+    element = "PAttrSDDefinition\n\tElementName={}\n\tDescription=1\n\tDisplayName=2\n\tElementIndex={}\n\tDataType={}\n"
+    given = [attribute("A", 1, datatype="SD") + element.format("E", 0, "Int32") + more
+             for more in ("", element.format("F", 1, "String"))]
+    one, two = (programs.compile(class_source(text, head="\tName=C\n"), name)
+                for text, name in zip(given, ("one.cdef", "two.cdef")))
+    found = [each for each in differences_in(programs.diff("--json", one, two)[1]) if each.get("field") == "ra_dflt_value"]
+    number = {"data_type": "Int32", "value": 0}
+    same([found[0]["before"], found[0]["after"]], [[number], [number, {"data_type": "String", "value": ""}]], "values")
+
+
+def test_json_has_all_differences(programs):
+    """As many as the text has lines."""
+    for path in sorted(CASES.glob("*.expect")):
+        source, text, _ = read_case(path)
+        one, two = programs.compile(base(), "one.cdef"), programs.compile(source, "two.cdef")
+        found = differences_in(programs.diff("--json", one, two)[1])
+        same(len(found), len(text.splitlines()), path.stem)
+
+
+def test_mentions_in_json(programs):
+    """Those of standard error, whatever the level."""
+    for level in ((), ("--compat",)):
+        old, new = (class_source(head="\tName=C\n", control=f"ControlDefinition\n\tFileVersion=1.{minor}.0.0\n")
+                    for minor in (10, 2))
+        one, two = programs.compile(old, "one.cdef"), programs.compile(new, "two.cdef", "-s")
+        orders = ["little-endian", "big-endian"]
+        if sys.byteorder == "big":
+            orders.reverse()
+        said = json.loads(programs.diff("--json", *level, one, two)[1])["mentions"]
+        same(said, [{"mention": "lower_version", "class": "C", "before": "1.10.0.0", "after": "1.2.0.0"},
+                    {"mention": "byte_order", "before": orders[0], "after": orders[1]}], "mentions")
 
 
 def test_references_that_are_never_set_may_be_none(programs):

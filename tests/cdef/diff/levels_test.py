@@ -150,8 +150,7 @@ def test_lower_version_is_mentioned(programs):  # noqa: F811
 def test_renamed_in_json(programs):  # noqa: F811
     """The path has the old name, beside it is the new one."""
     status, text, _ = compared(programs, [("\tName=List\n", "\tName=Lister\n")], "--json")
-    found = json.loads(text)
-    found = found["differences"] if isinstance(found, dict) else found
+    found = json.loads(text)["differences"]
     reason = {"code": "CMP101", "level": "readers", "reason": "readers miss it"}
-    path = [{"kind": "ResourceClass", "name": "'Disk'"}, {"kind": "ClassAction", "name": "'List'"}]
-    same((status, found), (1, [{"change": "renamed", "path": path, "name": "'Lister'", "breaks": [reason]}]))
+    path = [{"kind": "ResourceClass", "name": "Disk"}, {"kind": "ClassAction", "name": "List"}]
+    same((status, found), (1, [{"change": "renamed", "path": path, "name": "Lister", "breaks": [reason]}]))

@@ -16,6 +16,7 @@ void add_dump(CLI::App &app, int &status);
 void add_build(CLI::App &app, int &status);
 void add_check(CLI::App &app, int &status);
 void add_explain(CLI::App &app, int &status);
+void add_lsp(CLI::App &app, int &status);
 
 /* The program; returns its exit status. */
 int cdef_main(int argc, char **argv);

@@ -1,0 +1,59 @@
+/* files.cpp: the files that the language server reads. */
+
+#include "cdef/lsp/files.h"
+
+#include "cdef/support/failure.h"
+#include "cdef/support/replace.h"
+#include "report/places.h"
+
+#include <algorithm>
+#include <filesystem>
+#include <system_error>
+
+namespace cdef {
+
+namespace {
+
+constexpr std::uintmax_t FILE_MAX = 64UL * 1024 * 1024; /* bytes */
+constexpr std::size_t SOURCES_MAX = 20'000;
+
+} // namespace
+
+std::optional<std::string> bytes_of_file(const std::string &path) {
+    std::error_code failed;
+    if (!std::filesystem::is_regular_file(path, failed) || std::filesystem::file_size(path, failed) > FILE_MAX ||
+        failed)
+        return std::nullopt;
+    try {
+        return text_of_file(path);
+    } catch (const failure &) {
+        return std::nullopt;
+    }
+}
+
+std::vector<std::string> sources_below(const std::string &folder) {
+    using std::filesystem::recursive_directory_iterator;
+    std::vector<std::string> found;
+    std::error_code failed;
+    recursive_directory_iterator end;
+    recursive_directory_iterator at(folder, std::filesystem::directory_options::skip_permission_denied, failed);
+    while (!failed && at != end && found.size() < SOURCES_MAX) {
+        std::error_code unknown;
+        if (at->is_directory(unknown) && at->path().filename().native().starts_with('.'))
+            at.disable_recursion_pending();
+        else if (at->path().extension() == ".cdefsrc" && at->is_regular_file(unknown))
+            found.push_back(at->path().string());
+        at.increment(failed);
+    }
+    std::sort(found.begin(), found.end());
+    return found;
+}
+
+std::string explanations_page() {
+    std::error_code failed;
+    std::filesystem::path program = std::filesystem::read_symlink("/proc/self/exe", failed);
+    std::filesystem::path page = (program.parent_path() / CDGEN_DOCUMENTS / "docs/messages.md").lexically_normal();
+    return !failed && std::filesystem::exists(page, failed) ? report::uri_of(page.string()) : std::string();
+}
+
+} // namespace cdef

@@ -1,0 +1,119 @@
+/* lsp.cpp: the subcommand that serves editors: standard input and output carry the messages. */
+
+#include "cdef/cdef.h"
+#include "cdef/lsp/files.h"
+#include "cdef/support/failure.h"
+#include "cdef/support/output.h"
+#include "cdef/support/status.h"
+#include "server/framing.h"
+#include "server/server.h"
+
+#include <CLI/CLI.hpp>
+
+#include <array>
+#include <cerrno>
+#include <csignal>
+#include <cstring>
+#include <memory>
+#include <poll.h>
+#include <string>
+#include <string_view>
+#include <unistd.h>
+
+namespace cdef {
+
+namespace {
+
+struct lsp_options {
+    bool standard_streams = false; /* accepted, since clients pass it; there is no other way */
+    std::string explanations;
+};
+
+/* The server between two streams of bytes. */
+class connection {
+public:
+    explicit connection(const lsp_options &options)
+        : server({.read = bytes_of_file,
+                  .sources_in = sources_below,
+                  .explanations = options.explanations.empty() ? explanations_page() : options.explanations,
+                  .version = CDGEN_VERSION}) {}
+
+    int serve();
+
+private:
+    bool is_ready(int milliseconds) const;
+    bool read_some();
+    void write_all();
+    bool client_is_gone() const;
+
+    lsp::server server;
+    lsp::frame_reader frames;
+    bool ended = false; /* the input */
+};
+
+/* Whether input can be read, or has ended, within this time; -1: however long it takes. */
+bool connection::is_ready(int milliseconds) const {
+    pollfd input = {STDIN_FILENO, POLLIN, 0};
+    return !ended && poll(&input, 1, milliseconds) > 0;
+}
+
+/* Whether there was input. */
+bool connection::read_some() {
+    std::array<char, 65536> buffer;
+    ssize_t size = read(STDIN_FILENO, buffer.data(), buffer.size());
+    if (size < 0 && errno == EINTR)
+        return true;
+    if (size < 0)
+        throw failure(std::string("standard input: cannot read because: ") + std::strerror(errno));
+    ended = size == 0;
+    std::string_view bytes(buffer.data(), static_cast<size_t>(size));
+    while (std::optional<lsp::frame> next = frames.take(bytes))
+        server.receive(*next);
+    return !ended;
+}
+
+void connection::write_all() {
+    std::string all;
+    for (const std::string &body : server.take_output())
+        all += lsp::framed(body);
+    if (!all.empty())
+        print(all);
+}
+
+bool connection::client_is_gone() const {
+    std::optional<int> process = server.client_process();
+    return process && *process > 0 && kill(*process, 0) != 0 && errno == ESRCH;
+}
+
+/* All that has arrived is received before the next step is done, so that a cancellation comes in time. Returns the
+ * program's status. */
+int connection::serve() {
+    constexpr int LOOK_AFTER_CLIENT = 3000; /* milliseconds */
+    while (!server.exit_status()) {
+        if (!server.has_work())
+            write_all();
+        if (!server.is_full() && is_ready(server.has_work() ? 0 : LOOK_AFTER_CLIENT) && read_some())
+            continue;
+        if (server.has_work())
+            server.work();
+        else if (ended || client_is_gone())
+            return FOUND;
+        write_all();
+    }
+    write_all();
+    return *server.exit_status();
+}
+
+} // namespace
+
+void add_lsp(CLI::App &app, int &status) {
+    auto options = std::make_shared<lsp_options>();
+    CLI::App *command = app.add_subcommand("lsp", "Serves editors: the Language Server Protocol on standard streams");
+    command->add_flag("--stdio", options->standard_streams, "Ignored: there is no other way to connect");
+    command->add_option("--explanations", options->explanations,
+                        "URI of the page that explains the codes, instead of the installed one");
+    command->footer(status_help("lsp"));
+    command->callback([options, &status] { status = connection(*options).serve(); });
+}
+
+} // namespace cdef

@@ -1,0 +1,46 @@
+/* diagnostics.h: findings as the protocol shows them. */
+#ifndef CDGEN_SERVER_DIAGNOSTICS_H
+#define CDGEN_SERVER_DIAGNOSTICS_H
+
+#include "check/check.h"
+#include "server/positions.h"
+#include "server/rpc.h"
+
+#include <span>
+#include <string>
+#include <string_view>
+
+namespace lsp {
+
+/* What a client understands, and where explanations are. */
+struct diagnostic_form {
+    encoding units = encoding::utf16;
+    bool relates = true;      /* the client shows related places; without, notes are added to the message */
+    bool links = true;        /* the client follows links of codes */
+    std::string explanations; /* where the page about all codes is, a URI; empty: nowhere */
+};
+
+/* Where the places of findings are in a text, in bytes. */
+class finding_places {
+public:
+    explicit finding_places(std::string_view of_text);
+
+    /* A place without column is the text of its line; one without line the beginning of the source. */
+    stretch of(const check::place &at) const;
+    /* An edit's; nothing is removed where its end is its beginning. */
+    stretch of(const check::edit &change) const;
+
+private:
+    std::size_t offset(std::size_t line, std::size_t column) const;
+
+    std::string_view text;
+    std::vector<std::size_t> begins; /* of the lines that end with a newline, as findings count them */
+};
+
+/* The list of diagnostics of a document. */
+json diagnostics_of(std::string_view text, const line_table &lines, const std::string &uri,
+                    std::span<const check::finding> findings, const diagnostic_form &form);
+
+} // namespace lsp
+
+#endif

@@ -1,0 +1,189 @@
+/* server.cpp: the life of the language server, and which feature a message is for. */
+
+#include "server/server.h"
+
+#include "server/synchronisation.h"
+
+#include <array>
+#include <exception>
+#include <new>
+#include <utility>
+
+namespace lsp {
+
+namespace {
+
+struct request_row {
+    std::string_view method;
+    json (*answer)(session &, const json &params);
+};
+
+constexpr std::array<request_row, 0> requests = {};
+
+struct notification_row {
+    std::string_view method;
+    void (*take)(session &, const json &params);
+};
+
+constexpr std::array notifications = {
+    notification_row{"textDocument/didOpen", did_open},
+    notification_row{"textDocument/didChange", did_change},
+    notification_row{"textDocument/didClose", did_close},
+};
+
+const json *method_of(const json &message) {
+    const json *method = optional_member(message, "method");
+    return method != nullptr && method->is_string() ? method : nullptr;
+}
+
+/* The identifier of a request; null for anything else. */
+const json *request_id(const json &message) {
+    const json *id = optional_member(message, "id");
+    return id != nullptr && is_id(*id) && method_of(message) != nullptr ? id : nullptr;
+}
+
+json params_of(const json &message) {
+    const json *params = optional_member(message, "params");
+    return params == nullptr ? json::object() : *params;
+}
+
+} // namespace
+
+void server::refuse(const json &id, error_code code, std::string_view text) {
+    now.send(error_response(id, code, text));
+}
+
+void server::receive(const frame &message) {
+    switch (message.state) {
+    case frame_state::bad_header:
+        refuse(nullptr, PARSE_ERROR, "not a header with a Content-Length");
+        status = 1;
+        return;
+    case frame_state::too_large:
+        return refuse(nullptr, INVALID_REQUEST, "the message is too large");
+    case frame_state::other_charset:
+        return refuse(nullptr, INVALID_REQUEST, "the message is not in UTF-8");
+    case frame_state::whole:
+        break;
+    }
+    try {
+        json content = parsed(message.body);
+        if (!content.is_object())
+            return refuse(nullptr, INVALID_REQUEST, "the message is not an object");
+        const json *method = method_of(content);
+        if (method != nullptr && *method == "$/cancelRequest")
+            return cancel(params_of(content));
+        waiting.push_back({std::move(content), message.body.size()});
+        waiting_bytes += message.body.size();
+    } catch (const request_error &wrong) {
+        refuse(nullptr, wrong.code, wrong.what());
+    }
+}
+
+void server::cancel(const json &params) {
+    const json *id = optional_member(params, "id");
+    for (waiting_message &each : waiting)
+        if (const json *waits = request_id(each.content); waits != nullptr && id != nullptr && *waits == *id)
+            each.cancelled = true;
+}
+
+bool server::has_work() const {
+    return !status && (!waiting.empty() || (state == phase::initialized && !now.unpublished.empty()));
+}
+
+void server::work() {
+    if (waiting.empty())
+        return publish_next(now);
+    waiting_message message = std::move(waiting.front());
+    waiting.pop_front();
+    waiting_bytes -= message.size;
+    handle(message);
+}
+
+/* A response answers a request of the server, none of which needs its answer. */
+void server::handle(const waiting_message &waited) {
+    const json &message = waited.content;
+    const json *id = optional_member(message, "id");
+    if (method_of(message) == nullptr) {
+        bool is_response = message.contains("result") || message.contains("error");
+        if (!is_response)
+            refuse(id != nullptr && is_id(*id) ? *id : json(), INVALID_REQUEST, "the message has no method");
+    } else if (message.contains("id") && (id == nullptr || !is_id(*id)))
+        refuse(nullptr, INVALID_REQUEST, "an id is a text or a number");
+    else if (id != nullptr)
+        handle_request(waited);
+    else
+        handle_notification(message);
+}
+
+void server::handle_request(const waiting_message &waited) {
+    const json &message = waited.content;
+    const json &id = message.at("id");
+    if (waited.cancelled)
+        return refuse(id, REQUEST_CANCELLED, "cancelled");
+    try {
+        now.send(response(id, answer(message.at("method").get<std::string>(), params_of(message))));
+    } catch (const request_error &wrong) {
+        refuse(id, wrong.code, wrong.what());
+    } catch (const std::bad_alloc &) {
+        throw;
+    } catch (const std::exception &defect) {
+        refuse(id, INTERNAL_ERROR, defect.what());
+    }
+}
+
+json server::answer(const std::string &method, const json &params) {
+    if (method == "initialize")
+        return initialize(params);
+    if (state == phase::fresh)
+        throw request_error(NOT_INITIALIZED, "initialize comes first");
+    if (state == phase::shut_down)
+        throw request_error(INVALID_REQUEST, "the server has shut down");
+    if (method == "shutdown") {
+        state = phase::shut_down;
+        return nullptr;
+    }
+    for (const request_row &each : requests)
+        if (each.method == method)
+            return each.answer(now, params);
+    throw request_error(METHOD_NOT_FOUND, method + ": no such method");
+}
+
+json server::initialize(const json &params) {
+    if (state != phase::fresh)
+        throw request_error(INVALID_REQUEST, "initialize comes once");
+    now.client = abilities_in(params);
+    if (const json *id = optional_member(params, "processId"); id != nullptr && id->is_number_integer())
+        process = id->get<int>();
+    state = phase::initialized;
+    return {{"capabilities", offers_to(now.client)},
+            {"serverInfo", {{"name", "cdef"}, {"version", now.world.version}}}};
+}
+
+/* What is wrong with a notification nobody is told: there is no answer to it. */
+void server::handle_notification(const json &message) {
+    const std::string method = message.at("method").get<std::string>();
+    if (method == "exit") {
+        status = state == phase::shut_down ? 0 : 1;
+        return;
+    }
+    if (state != phase::initialized)
+        return;
+    try {
+        for (const notification_row &each : notifications)
+            if (each.method == method)
+                each.take(now, params_of(message));
+    } catch (const request_error &wrong) {
+        constexpr int LOG_WARNING = 2;
+        now.send(notification("window/logMessage", {{"type", LOG_WARNING}, {"message", method + ": " + wrong.what()}}));
+    }
+}
+
+std::vector<std::string> server::take_output() {
+    std::vector<std::string> bodies;
+    for (const json &each : std::exchange(now.outbox, {}))
+        bodies.push_back(written(each));
+    return bodies;
+}
+
+} // namespace lsp

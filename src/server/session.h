@@ -1,0 +1,73 @@
+/* session.h: what the features of the server share: the client, its documents, and what is to be sent to it. */
+#ifndef CDGEN_SERVER_SESSION_H
+#define CDGEN_SERVER_SESSION_H
+
+#include "check/check.h"
+#include "server/diagnostics.h"
+#include "server/document.h"
+#include "server/rpc.h"
+
+#include <functional>
+#include <map>
+#include <optional>
+#include <set>
+#include <string>
+#include <vector>
+
+namespace lsp {
+
+/* What the server needs of the machine. */
+struct surroundings {
+    /* The bytes of a file; nothing if it cannot be read. */
+    std::function<std::optional<std::string>(const std::string &path)> read;
+    /* The sources in a folder and the folders in it, as paths, in order. */
+    std::function<std::vector<std::string>(const std::string &folder)> sources_in;
+    std::string explanations; /* where the page about all codes is, a URI; empty: nowhere */
+    std::string version;      /* of the program */
+};
+
+/* What the client has said of itself. */
+struct client_abilities {
+    encoding units = encoding::utf16;
+    bool relates = false;   /* shows places that are related to a finding */
+    bool links = false;     /* follows links of codes */
+    bool pulls = false;     /* asks for diagnostics itself */
+    bool refreshes = false; /* can be asked to ask again */
+    bool watches_files = false;
+    bool shows_progress = false;
+    bool versioned_edits = false;
+    bool snippets = false;
+    bool nested_symbols = false;
+    bool literal_actions = false; /* takes code actions, not just commands */
+};
+
+client_abilities abilities_in(const json &initialize);
+
+/* What the server offers to such a client. */
+json offers_to(const client_abilities &client);
+
+struct session {
+    explicit session(surroundings machine) : world(std::move(machine)) {
+        wanted.fill(true);
+    }
+
+    diagnostic_form form() const {
+        return {client.units, client.relates, client.links, world.explanations};
+    }
+    void send(json message) {
+        outbox.push_back(std::move(message));
+    }
+    /* The open document that the parameters of a request name. Throws request_error. */
+    document &document_in(const json &params);
+
+    surroundings world;
+    client_abilities client;
+    check::warning_set wanted;
+    std::map<std::string, document> open; /* by key_of their URIs */
+    std::set<std::string> unpublished;    /* keys of open documents that changed since their findings were sent */
+    std::vector<json> outbox;
+};
+
+} // namespace lsp
+
+#endif

@@ -120,7 +120,9 @@ void class_family::look_at_variables(const variable_class &variables, const std:
              place_of(same->second.source, other.name));
 }
 
-std::vector<check::finding> class_family::add(const std::string &source, const class_facts &facts) {
+std::vector<check::finding> class_family::add(const std::string &source, const class_facts &facts,
+                                              const check::warning_set &wanted_warnings) {
+    wanted = wanted_warnings;
     for (const mention &name : facts.classes)
         look_at_name(name, source);
     for (const mapping &map : facts.maps) {

@@ -43,10 +43,9 @@ class_facts facts_of(const check::view &source, std::span<const std::byte> image
 /* All sources of a build so far. */
 class class_family {
 public:
-    explicit class_family(const check::warning_set &wanted_warnings) : wanted(wanted_warnings) {}
-
-    /* Adds a source; returns warnings about it that its predecessors cause: one of each kind at the most. */
-    std::vector<check::finding> add(const std::string &source, const class_facts &facts);
+    /* Adds a source; returns the wanted warnings about it that its predecessors cause: one of each kind at the most. */
+    std::vector<check::finding> add(const std::string &source, const class_facts &facts,
+                                    const check::warning_set &wanted_warnings);
 
 private:
     template <class Fact> struct member {
@@ -60,7 +59,7 @@ private:
     void look_at_manager(const mapping &map);
     void look_at_variables(const variable_class &variables, const std::string &source);
 
-    check::warning_set wanted;
+    check::warning_set wanted = {};                                 /* of the source that is being added */
     std::map<std::string, member<check::mention>> classes;          /* by name */
     std::map<std::string, std::vector<member<mapping>>> maps;       /* by catalog */
     std::map<std::string, member<variable_class>> variable_classes; /* by name */

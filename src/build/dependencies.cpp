@@ -42,6 +42,8 @@ std::string dependencies_of(std::span<const unit> units) {
         rules.append(":");
         if (each.source != "-")
             rules.append(" ").append(rule_name(each.source));
+        if (!each.project_file.empty())
+            rules.append(" ").append(rule_name(each.project_file));
         rules += '\n';
     }
     return rules;

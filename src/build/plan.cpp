@@ -70,14 +70,14 @@ std::string database_name_of(std::string_view source) {
     return std::string(name).append(SUFFIX);
 }
 
-std::vector<unit> plan_of(const std::vector<std::string> &sources, const naming &how) {
-    if (how.file && sources.size() > 1)
-        throw wrong_request("-o names one database, and there are " + std::to_string(sources.size()) +
+std::vector<unit> plan_of(std::span<const request> requests) {
+    if (requests.size() > 1 && requests.front().how.file)
+        throw wrong_request("-o names one database, and there are " + std::to_string(requests.size()) +
                             " sources: use -d");
     std::vector<unit> units;
-    for (const std::string &source : sources) {
+    for (const auto &[source, how, project_file] : requests) {
         std::string database = database_of(source, how);
-        units.push_back({source, database, outputs_of(database, how.order)});
+        units.push_back({source, database, outputs_of(database, how.order), project_file});
     }
     require_different(units);
     return units;

@@ -6,6 +6,7 @@
 
 #include <bit>
 #include <optional>
+#include <span>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -24,6 +25,7 @@ struct unit {
     std::string
         named_after; /* the database, without a byte order in its name, after which a nameless class is called */
     std::vector<output> outputs;
+    std::string project_file = {}; /* that had a say in it; empty if there is none */
 };
 
 enum class byte_order { native, little, big, both };
@@ -34,11 +36,18 @@ struct naming {
     byte_order order = byte_order::native;
 };
 
+/* A source, and what is wanted of it. */
+struct request {
+    std::string source;
+    naming how = {};
+    std::string project_file = {};
+};
+
 /* "NAME.cdef" for a source DIRECTORY/NAME.cdefsrc; what ends otherwise keeps its end. */
 std::string database_name_of(std::string_view source);
 
 /* Throws wrong_request if the names make no sense together, or if two databases would have the same one. */
-std::vector<unit> plan_of(const std::vector<std::string> &sources, const naming &how);
+std::vector<unit> plan_of(std::span<const request> requests);
 
 } // namespace build
 

@@ -19,6 +19,7 @@
 #include <filesystem>
 #include <map>
 #include <memory>
+#include <set>
 #include <sys/time.h>
 #include <thread>
 #include <utility>
@@ -39,7 +40,7 @@ struct build_options {
     std::vector<std::string> operands;
     std::optional<std::string> file;
     std::optional<std::string> directory;
-    std::string order = "native";
+    std::optional<std::string> order;
     std::optional<std::string> timestamp;
     std::optional<std::string> depfile;
     unsigned jobs = std::max(1U, std::thread::hardware_concurrency());
@@ -62,9 +63,35 @@ orb_timeval32_t wanted_time(const build_options &options) {
                           {static_cast<vx_uint32_t>(now.tv_sec), static_cast<vx_uint32_t>(now.tv_usec)});
 }
 
-std::vector<build::unit> wanted_units(const build_options &options) {
-    return build::plan_of(build_command::sources_of(options.operands),
-                          {options.file, options.directory, byte_orders.at(options.order)});
+/* What the options say, and where they say nothing, the project file. */
+build::naming naming_of(const build_options &options, const config::settings &settings) {
+    std::string order = options.order.value_or(settings.byte_order.empty() ? "native" : settings.byte_order);
+    build::naming how = {options.file, options.directory, byte_orders.at(order)};
+    if (!how.file && !how.directory && !settings.directory.empty())
+        how.directory = settings.directory;
+    return how;
+}
+
+/* What is to be made, and by which rules. */
+struct assignment {
+    std::vector<build::unit> units;
+    std::vector<finding_rules> rules;  /* for each of them */
+    std::set<std::string> directories; /* where databases go, if not beside their sources */
+};
+
+assignment assignment_of(const build_options &options) {
+    project_files projects(options.findings.project);
+    std::vector<build::request> requests;
+    assignment all;
+    for (const std::string &source : build_command::sources_of(options.operands)) {
+        const config::settings &settings = projects.of(source);
+        requests.push_back({source, naming_of(options, settings), settings.path});
+        all.rules.push_back(options.findings.rules(settings));
+        if (const auto &directory = requests.back().how.directory)
+            all.directories.insert(*directory);
+    }
+    all.units = build::plan_of(requests);
+    return all;
 }
 
 void list_outputs(const std::vector<build::unit> &units) {
@@ -93,23 +120,23 @@ void make_directory(const std::string &path) {
 
 int build_all(const build_options &options) {
     require_no_contradiction(options);
-    std::vector<build::unit> units = wanted_units(options);
+    auto [units, rules, directories] = assignment_of(options);
     if (options.list) {
         list_outputs(units);
         return OK;
     }
-    std::string rules = options.depfile ? build::dependencies_of(units) : "";
+    std::string dependencies = options.depfile ? build::dependencies_of(units) : "";
     signal(SIGXFSZ, SIG_IGN); /* a file that may not grow and a stream that nobody reads are errors of the call */
     signal(SIGPIPE, SIG_IGN);
-    if (options.directory)
-        make_directory(*options.directory);
-    build_run run(units, {wanted_time(options), options.findings, options.sync});
+    for (const std::string &directory : directories)
+        make_directory(directory);
+    build_run run(units, {wanted_time(options), options.findings, std::move(rules), options.sync});
     build_command::do_in_order<outcome>(
         units.size(), options.jobs, [&run](std::size_t index) { return run.make(index); },
         [&run](std::size_t index, outcome &&made) { run.show(index, std::move(made)); });
     int status = run.finish();
     if (status == OK && options.depfile)
-        replace_file(*options.depfile, rules);
+        replace_file(*options.depfile, dependencies);
     return status;
 }
 

@@ -18,6 +18,7 @@ constexpr unsigned MOST_JOBS = 1024;
 struct run_options {
     orb_timeval32_t time;
     const finding_options &findings;
+    std::vector<finding_rules> rules; /* for each unit */
     bool sync;
 };
 
@@ -34,7 +35,7 @@ struct outcome {
 
 class build_run {
 public:
-    build_run(const std::vector<build::unit> &units, const run_options &options);
+    build_run(const std::vector<build::unit> &units, run_options options);
 
     /* Compiles a source and writes its databases; several threads may do so at once. */
     outcome make(size_t index) const;
@@ -44,11 +45,10 @@ public:
     int finish();
 
 private:
-    void make_databases(const build::unit &what, outcome &made) const;
+    void make_databases(size_t index, outcome &made) const;
 
     const std::vector<build::unit> &units;
     run_options options;
-    check::warning_set wanted;
     build::class_family family;
     std::unique_ptr<report::writer> writer;
     progress line;

@@ -29,15 +29,15 @@ void clear_remains(const build::unit &what) {
 
 } // namespace
 
-build_run::build_run(const std::vector<build::unit> &all, const run_options &how)
-    : units(all), options(how), wanted(how.findings.warnings()), family(wanted), writer(how.findings.writer()),
-      line(all.size()), databases(count_of_databases(all)) {}
+build_run::build_run(const std::vector<build::unit> &all, run_options how)
+    : units(all), options(std::move(how)), writer(options.findings.writer()), line(all.size()),
+      databases(count_of_databases(all)) {}
 
 outcome build_run::make(size_t index) const {
     outcome made;
     try {
         clear_remains(units[index]);
-        make_databases(units[index], made);
+        make_databases(index, made);
     } catch (const check::cannot_check &unreadable) {
         made.unreadable = unreadable.what();
     } catch (const failure &unwritten) {
@@ -46,13 +46,16 @@ outcome build_run::make(size_t index) const {
     return made;
 }
 
-void build_run::make_databases(const build::unit &what, outcome &made) const {
+void build_run::make_databases(size_t index, outcome &made) const {
+    const build::unit &what = units[index];
+    const finding_rules &rules = options.rules[index];
     require_source(what.source);
-    build::compiled result = build::compile(
-        what, options.time, wanted, [&made](check::finding &&found) { made.findings.push_back(std::move(found)); });
+    build::compiled result = build::compile(what, options.time, rules.wanted, [&made](check::finding &&found) {
+        made.findings.push_back(std::move(found));
+    });
     made.count = result.count;
     made.facts = std::move(result.facts);
-    if (!options.findings.pass(made.count))
+    if (!rules.pass(made.count))
         return;
     for (size_t i = 0; i < what.outputs.size(); ++i) {
         try {
@@ -66,7 +69,7 @@ void build_run::make_databases(const build::unit &what, outcome &made) const {
 
 /* What other classes say of this one comes after what it says of itself. Its database has been written meanwhile. */
 void build_run::show(size_t index, outcome &&made) {
-    for (check::finding &found : family.add(units[index].source, made.facts)) {
+    for (check::finding &found : family.add(units[index].source, made.facts, options.rules[index].wanted)) {
         made.findings.push_back(std::move(found));
         ++made.count.warnings;
     }
@@ -83,7 +86,7 @@ void build_run::show(size_t index, outcome &&made) {
     line.show(index + 1, units[index].source);
     written += made.written;
     unchanged += made.unchanged;
-    all_pass = all_pass && options.findings.pass(made.count);
+    all_pass = all_pass && options.rules[index].pass(made.count);
     no_fault = no_fault && made.unreadable.empty() && made.unwritten.empty();
 }
 

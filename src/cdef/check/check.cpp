@@ -25,8 +25,8 @@ struct check_options {
     bool changes_nothing = false; /* only shows what would be fixed */
 };
 
-check::totals check_source(const std::string &source, const check_options &options, report::writer &to) {
-    check::warning_set wanted = options.findings.warnings();
+check::totals check_source(const std::string &source, const check_options &options, const check::warning_set &wanted,
+                           report::writer &to) {
     auto add = [&to](const check::finding &found) { to.add(found); };
     require_source(source);
     if (options.fixes)
@@ -41,18 +41,29 @@ void require_output(const check_options &options) {
         throw failure("--fix writes to standard output here, and so does --format " + options.findings.form);
 }
 
+/* For each source, before anything is shown: a project file may have errors. */
+std::vector<finding_rules> rules_of(const check_options &options) {
+    project_files projects(options.findings.project);
+    std::vector<finding_rules> rules;
+    for (const std::string &source : options.sources)
+        rules.push_back(options.findings.rules(projects.of(source)));
+    return rules;
+}
+
 /* Checks all sources. */
 int check_all(const check_options &options) {
     require_output(options);
+    std::vector<finding_rules> rules = rules_of(options);
     std::unique_ptr<report::writer> form = options.findings.writer();
     bool pass = true;
     bool read = true;
-    for (const std::string &source : options.sources) {
+    for (std::size_t i = 0; i < rules.size(); ++i) {
+        const std::string &source = options.sources[i];
         form->begin_source(source);
         try {
-            check::totals count = check_source(source, options, *form);
+            check::totals count = check_source(source, options, rules[i].wanted, *form);
             form->end_source(count);
-            pass = pass && options.findings.pass(count);
+            pass = pass && rules[i].pass(count);
         } catch (const check::cannot_check &unreadable) {
             options.findings.fail_source(*form, unreadable.what());
             read = false;

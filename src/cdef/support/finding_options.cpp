@@ -6,6 +6,7 @@
 #include "cdef/support/forms.h"
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
+#include "check/switches.h"
 
 #include <CLI/CLI.hpp>
 
@@ -29,13 +30,6 @@ std::vector<std::string> warning_names() {
     return names;
 }
 
-void switch_warnings(check::warning_set &set, const std::vector<std::string> &names, bool on) {
-    for (const std::string &name : names)
-        for (const warning &known : check::warnings)
-            if (name == "all" || name == known.name || name == known.code)
-                set[known.id] = on;
-}
-
 void show_text(std::string_view text) {
     if (std::fwrite(text.data(), 1, text.size(), stderr) != text.size())
         throw failure("standard error: cannot write");
@@ -43,12 +37,11 @@ void show_text(std::string_view text) {
 
 } // namespace
 
-check::warning_set finding_options::warnings() const {
-    check::warning_set set;
-    set.fill(true);
-    switch_warnings(set, unwanted, false);
-    switch_warnings(set, wanted, true);
-    return set;
+finding_rules finding_options::rules(const config::settings &settings) const {
+    finding_rules all = {settings.warnings(), warnings_count.value_or(settings.warnings_count)};
+    check::switch_warnings(all.wanted, unwanted, false);
+    check::switch_warnings(all.wanted, wanted, true);
+    return all;
 }
 
 std::unique_ptr<report::writer> finding_options::writer() const {
@@ -88,7 +81,10 @@ void add_finding_options(CLI::App &command, finding_options &options) {
         ->type_name("NAME")
         ->allow_extra_args(false)
         ->check(CLI::IsMember(warning_names()));
-    command.add_flag("--werror", options.warnings_count, "Count warnings as errors");
+    auto set_count = [&options](bool count) { return [&options, count] { options.warnings_count = count; }; };
+    CLI::Option *werror = command.add_flag_callback("--werror", set_count(true), "Count warnings as errors");
+    command.add_flag_callback("--no-werror", set_count(false), "Do not, whatever cdef.toml says")->excludes(werror);
+    add_project_options(command, options.project);
 }
 
 void require_source(const std::string &path) {

@@ -2,10 +2,12 @@
 #ifndef CDGEN_CDEF_FINDING_OPTIONS_H
 #define CDGEN_CDEF_FINDING_OPTIONS_H
 
+#include "cdef/support/project_files.h"
 #include "check/check.h"
 #include "report/report.h"
 
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -15,28 +17,37 @@ class App;
 
 namespace cdef {
 
-struct finding_options {
-    std::string form;
-    std::vector<std::string> wanted;
-    std::vector<std::string> unwanted;
+/* Which findings a source may have. */
+struct finding_rules {
+    check::warning_set wanted;
     bool warnings_count = false; /* as errors do */
-    report::text_settings text = {.shown_max = 100};
-    std::string colour = "auto";
 
-    /* All warnings but the unwanted ones; a name that is given both ways is wanted. */
-    check::warning_set warnings() const;
-    /* What writes findings in the form: text to standard error, other forms to standard output. */
-    std::unique_ptr<report::writer> writer() const;
-    /* Reports a source that could not be read. why: a message that names the source. */
-    void fail_source(report::writer &to, const std::string &why) const;
     /* Whether a source with so many findings is good. */
     bool pass(const check::totals &count) const {
         return count.errors == 0 && (count.warnings == 0 || !warnings_count);
     }
 };
 
-/* Adds --format, --max, --quiet, --color, --warn, --no-warn and --werror, whose values are stored in the options; these
- * must stay as long as the command. */
+struct finding_options {
+    std::string form;
+    std::vector<std::string> wanted;
+    std::vector<std::string> unwanted;
+    std::optional<bool> warnings_count; /* as errors do */
+    report::text_settings text = {.shown_max = 100};
+    std::string colour = "auto";
+    project_options project;
+
+    /* What the options say, and where they say nothing, the project file. All warnings are wanted but the unwanted
+     * ones; a name that is given both ways is wanted. */
+    finding_rules rules(const config::settings &settings) const;
+    /* What writes findings in the form: text to standard error, other forms to standard output. */
+    std::unique_ptr<report::writer> writer() const;
+    /* Reports a source that could not be read. why: a message that names the source. */
+    void fail_source(report::writer &to, const std::string &why) const;
+};
+
+/* Adds --format, --max, --quiet, --color, --warn, --no-warn, --werror, --no-werror, --config and --no-config, whose
+ * values are stored in the options; these must stay as long as the command. */
 void add_finding_options(CLI::App &command, finding_options &options);
 
 /* Throws check::cannot_check for a database, and names the subcommand that checks it. */

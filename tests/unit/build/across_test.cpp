@@ -34,12 +34,13 @@ protected:
         check::check_bytes(
             text, name, {}, [](check::finding &&) {}, &job);
         codes all;
-        for (const check::finding &each : family.add(name, facts))
+        for (const check::finding &each : family.add(name, facts, wanted))
             all.push_back(found_in::shown(each) + " " + each.text);
         return all;
     }
 
-    build::class_family family{found_in::all_warnings()};
+    check::warning_set wanted = found_in::all_warnings();
+    build::class_family family;
 };
 
 TEST_F(Across, ReportsAClassOfTheSameName) {
@@ -77,9 +78,7 @@ TEST_F(Across, ReportsVariableClassesThatDiffer) {
 }
 
 TEST_F(Across, IsSilentAboutWhatIsNotWanted) {
-    check::warning_set wanted = found_in::all_warnings();
     wanted[check::SHARED_NAME] = wanted[check::SHARED_KEYS] = false;
-    family = build::class_family(wanted);
     EXPECT_EQ(add("a", found_in::CLASS), codes());
     EXPECT_EQ(add("b", found_in::CLASS), codes());
 }

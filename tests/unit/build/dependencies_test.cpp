@@ -27,8 +27,9 @@ TEST(Dependencies, DoublesBackslashesOnlyWhereTheyWouldEscape) {
 
 TEST(Dependencies, HaveARuleForEachUnit) {
     std::vector<build::unit> units = {{"a b", "c", {{"x", std::endian::little}, {"y", std::endian::big}}},
-                                      {"-", "d", {{"d", std::endian::little}}}};
-    EXPECT_EQ(build::dependencies_of(units), "x y: a\\ b\nd:\n");
+                                      {"-", "d", {{"d", std::endian::little}}},
+                                      {"e", "f", {{"f", std::endian::little}}, "g h/cdef.toml"}};
+    EXPECT_EQ(build::dependencies_of(units), "x y: a\\ b\nd:\nf: e g\\ h/cdef.toml\n");
 }
 
 } // namespace

@@ -8,8 +8,14 @@ namespace {
 
 using build::byte_order;
 using build::naming;
-using build::plan_of;
 using names = std::vector<std::string>;
+
+std::vector<build::unit> plan_of(const names &sources, const naming &how) {
+    std::vector<build::request> requests;
+    for (const std::string &source : sources)
+        requests.push_back({source, how});
+    return build::plan_of(requests);
+}
 
 names outputs(const names &sources, const naming &how) {
     names all;
@@ -59,6 +65,15 @@ TEST(Plan, ChoosesTheByteOrder) {
     EXPECT_EQ(plan_of({"a"}, {}).at(0).outputs.at(0).order, std::endian::native);
     EXPECT_EQ(plan_of({"a"}, {.order = byte_order::little}).at(0).outputs.at(0).order, std::endian::little);
     EXPECT_EQ(plan_of({"a"}, {.order = byte_order::big}).at(0).outputs.at(0).order, std::endian::big);
+}
+
+TEST(Plan, GivesEachSourceWhatItsProjectWants) {
+    std::vector<build::request> requests = {{"a.cdefsrc", {}, ""},
+                                            {"p/b.cdefsrc", {.directory = "p/out"}, "p/cdef.toml"}};
+    std::vector<build::unit> units = build::plan_of(requests);
+    EXPECT_EQ(units.at(0).outputs.at(0).path, "a.cdef");
+    EXPECT_EQ(units.at(1).outputs.at(0).path, "p/out/b.cdef");
+    EXPECT_EQ(units.at(1).project_file, "p/cdef.toml");
 }
 
 TEST(Plan, RefusesNamesThatMakeNoSense) {

@@ -1,0 +1,47 @@
+/* project_files.cpp: the project file (cdef.toml) that each source belongs to. */
+
+#include "cdef/support/project_files.h"
+
+#include "cdef/support/failure.h"
+
+#include <CLI/CLI.hpp>
+
+#include <filesystem>
+#include <utility>
+
+namespace cdef {
+
+void add_project_options(CLI::App &command, project_options &options) {
+    CLI::Option *file = command.add_option("--config", options.file, "Read FILE instead of the next cdef.toml");
+    file->type_name("FILE");
+    command.add_flag("--no-config", options.none, "Read no cdef.toml")->excludes(file);
+}
+
+const std::string &project_files::path_for(const std::string &source) {
+    if (options.none)
+        return paths[""];
+    if (options.file)
+        return *options.file;
+    std::string directory = std::filesystem::path(source).parent_path().string() + "/";
+    auto [at, is_new] = paths.emplace(directory, "");
+    if (is_new)
+        at->second = config::find(source);
+    return at->second;
+}
+
+const config::settings &project_files::load(const std::string &path) {
+    config::reading read = config::load(path);
+    for (size_t i = 0; i + 1 < read.problems.size(); ++i)
+        print_error(config::as_text(path, read.problems[i]));
+    if (!read.problems.empty())
+        throw failure(config::as_text(path, read.problems.back()));
+    return loaded.emplace(path, std::move(read.values)).first->second;
+}
+
+const config::settings &project_files::of(const std::string &source) {
+    const std::string &path = path_for(source);
+    auto known = loaded.find(path);
+    return known != loaded.end() ? known->second : load(path);
+}
+
+} // namespace cdef

@@ -129,6 +129,15 @@ std::string_view near_miss(std::string_view text, const name_list &names) {
     return near_guess(text, names).name();
 }
 
+name_list one_edit_from(std::string_view text, const name_list &names) {
+    name_list near;
+    if (text.size() > LONGEST_NAME)
+        return near;
+    std::copy_if(names.begin(), names.end(), std::back_inserter(near),
+                 [text](std::string_view name) { return distance(text, name, 2) <= 1; });
+    return near;
+}
+
 guess meant_by(std::string_view text, const name_list &names) {
     guess meant = near_guess(text, names);
     if (!meant.names.empty())

@@ -31,6 +31,9 @@ struct guess {
  * with a neighbour. Case does not count. Empty if no name is near enough, or if two are equally near. */
 std::string_view near_miss(std::string_view text, const name_list &names);
 
+/* All names that take one edit, as above, or none but the case of letters. */
+name_list one_edit_from(std::string_view text, const name_list &names);
+
 /* The near miss of a text; without one, the names that it is a part of. */
 guess meant_by(std::string_view text, const name_list &names);
 

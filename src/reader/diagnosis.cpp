@@ -16,8 +16,10 @@ namespace cdb {
 
 namespace {
 
-/* Not one of the rules of verify(), which sees what contradicts such a number. */
-constexpr rule contradicting = {CODE_CONTRADICTING, severity::error, "contradicts the rest of the file"};
+constexpr rule contradicting = {
+    CODE_CONTRADICTING, severity::error, "contradicts the rest of the file",
+    "No rule is about the number itself, but with another one in its place the file would have no error.",
+    "Compile the source again, or take another copy of the file: this one is damaged."};
 
 bool breaks(const finding &f, check rule) {
     return f.broken == &rule_of(rule);
@@ -175,6 +177,10 @@ std::vector<diagnosed> diagnose(const database &db) {
     if (repaired.succeeds())
         return caused_by_one(db, std::move(found), repaired);
     return caused_by_rule(std::move(found));
+}
+
+const rule &contradicting_rule() {
+    return contradicting;
 }
 
 } // namespace cdb

@@ -9,6 +9,9 @@ namespace cdb {
 /* Code of a number that no rule of verify() is about, and that everything found contradicts. */
 inline constexpr std::string_view CODE_CONTRADICTING = "CDB108";
 
+/* Its rule. It is not among rules(), since verify() sees only what contradicts such a number. */
+const rule &contradicting_rule();
+
 /* A finding, and which one it is a consequence of. */
 struct diagnosed {
     finding found;

@@ -3,6 +3,7 @@
 #define CDGEN_CDEF_EXPLAIN_CODES_H
 
 #include "check/examples.h"
+#include "language/suggestions.h"
 
 #include <string>
 #include <string_view>
@@ -27,9 +28,9 @@ std::vector<explanation> explanations();
 /* The one with a code, in any case, or with a warning's name. Null if there is none. */
 const explanation *find(const std::vector<explanation> &all, std::string_view code);
 
-/* The code, or the name of a warning, that is most like a text; the code with the nearest number if none is like it.
- * Empty if the text is nothing like a code. */
-std::string_view nearest(const std::vector<explanation> &all, std::string_view text);
+/* The codes and the names of warnings that are one edit from a text. Numbers that are close to each other mean nothing
+ * alike, so nothing else is near. */
+language::name_list nearest(const std::vector<explanation> &all, std::string_view text);
 
 } // namespace cdef
 

@@ -101,14 +101,27 @@ void add_json(report::json_writer &to, const explanation &shown) {
     to.close();
 }
 
+/* "S101", "S101 or S102", "S101, S102 or S103" */
+std::string joined(const language::name_list &names) {
+    std::string text;
+    for (std::size_t i = 0; i < names.size(); ++i) {
+        if (i > 0)
+            text += i + 1 < names.size() ? ", " : " or ";
+        text += names[i];
+    }
+    return text;
+}
+
 /* Throws failure if there is no such code. */
 const explanation &known(const std::vector<explanation> &all, const std::string &code) {
     const explanation *found = find(all, code);
     if (found != nullptr)
         return *found;
-    std::string_view meant = nearest(all, code);
-    throw failure(code + ": no such code; " +
-                  (meant.empty() ? "'cdef explain' lists all" : "did you mean " + std::string(meant) + "?"));
+    constexpr std::size_t OFFERED_MAX = 3;
+    language::name_list near = nearest(all, code);
+    std::string hint =
+        near.empty() || near.size() > OFFERED_MAX ? "'cdef explain' lists all" : "did you mean " + joined(near) + "?";
+    throw failure(code + ": no such code; " + hint);
 }
 
 int explain(const explain_options &options) {

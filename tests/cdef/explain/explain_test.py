@@ -78,11 +78,20 @@ def test_list():
     assert len(lines) == len(set(lines)) > 100
 
 
+def test_number_that_contradicts_the_file():
+    """Its code is not one of verification, but verify reports it."""
+    assert explain("CDB108")[1].startswith("CDB108: error: contradicts the rest of the file\n\nCause:\n")
+    codes = [line.split()[0] for line in explain()[1].splitlines()]
+    same(codes, sorted(codes, key=lambda code: (code.startswith("C"), code)), "order")
+
+
 def test_unknown_code():
-    """The nearest one is suggested."""
-    for given, meant in (("S10", "S101"), ("S199", "S201"), ("cdb999", "CDB453"), ("octl", "octal"), ("unbalance", "unbalanced"), ("S9999", "S919")):
+    """Those that are one edit away are suggested, unless they are many. Numbers near each other mean nothing."""
+    near = (("octl", "octal"), ("unbalance", "unbalanced"), ("S502x", "S502"), ("s5O9", "S509, S519 or S529"))
+    for given, meant in near:
         same(explain(given), (2, "", f"cdef: {given}: no such code; did you mean {meant}?\n"), given)
-    same(explain("S101", "spam"), (2, "", "cdef: spam: no such code; 'cdef explain' lists all\n"), "spam")
+    for given in ("S10", "CDB801", "S5555", "S9999", "S700", "cdb999", "spam", ""):
+        same(explain("S101", given), (2, "", f"cdef: {given}: no such code; 'cdef explain' lists all\n"), given)
 
 
 def test_json():

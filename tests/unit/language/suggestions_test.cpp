@@ -91,3 +91,11 @@ TEST(Listed, PutsAndBeforeTheLastName) {
 }
 
 } // namespace
+
+TEST(suggestions, all_names_that_are_one_edit_away) {
+    const language::name_list names = {"S201", "S205", "S215", "S509"};
+    EXPECT_EQ(language::one_edit_from("S2015", names), (language::name_list{"S201", "S205", "S215"}));
+    EXPECT_EQ(language::one_edit_from("s509", names), language::name_list{"S509"});
+    EXPECT_TRUE(language::one_edit_from("S5555", names).empty());
+    EXPECT_TRUE(language::one_edit_from(std::string(65, 'S'), names).empty());
+}

@@ -134,8 +134,10 @@ std::string some_value(chance &random) {
         return vxTypeStr[below(std::size(vxTypeStr), random)];
     case 1:
         return vxVarStr[below(std::size(vxVarStr), random)];
-    case 2:
-        return std::string(below(LONG, random), "a0,\\\""[below(5, random)]);
+    case 2: {
+        std::size_t length = below(LONG, random);
+        return std::string(length, "a0,\\\""[below(5, random)]);
+    }
     default:
         return std::string(one_of(odd_values, random));
     }
@@ -160,13 +162,17 @@ void remove_stanza(document &all, chance &random) {
 
 /* A stanza becomes one of another kind, with the same lines. */
 void rename_stanza(document &all, chance &random) {
-    one_of(all, random).header = sc_tables[below(SC_COUNT, random)].sc_name;
+    stanza &in = one_of(all, random);
+    in.header = sc_tables[below(SC_COUNT, random)].sc_name;
 }
 
 void move_line(document &all, chance &random) {
     stanza &from = one_of(all, random);
-    if (!from.attributes.empty())
-        insert_somewhere(one_of(all, random).attributes, take_some(from.attributes, random), random);
+    stanza &to = one_of(all, random);
+    if (!from.attributes.empty()) {
+        std::string moved = take_some(from.attributes, random);
+        insert_somewhere(to.attributes, std::move(moved), random);
+    }
 }
 
 void copy_line(document &all, chance &random) {
@@ -211,7 +217,8 @@ constexpr std::array<std::string_view, 12> marks = {"\"", "#", "//", "/*", "*/",
 void put_mark(document &all, chance &random) {
     stanza &in = one_of(all, random);
     std::string &line = in.attributes.empty() ? in.header : one_of(in.attributes, random);
-    line.insert(below(line.size() + 1, random), one_of(marks, random));
+    std::size_t place = below(line.size() + 1, random);
+    line.insert(place, one_of(marks, random));
 }
 
 /* Takes one quote away, or whatever the place holds. */

@@ -21,14 +21,19 @@ inline std::string hex(std::uint64_t number) {
     return "0x" + digits;
 }
 
-/* "001f": two digits for each byte. */
+/* Appends "001f": two digits for each byte. */
+inline void append_hex(std::string &to, std::span<const std::byte> bytes) {
+    for (std::byte b : bytes) {
+        to += HEX_DIGITS[std::to_integer<unsigned>(b) >> 4];
+        to += HEX_DIGITS[std::to_integer<unsigned>(b) & 0xF];
+    }
+}
+
+/* The same as a text of its own. */
 inline std::string hex_of(std::span<const std::byte> bytes) {
     std::string digits;
     digits.reserve(bytes.size() * 2);
-    for (std::byte b : bytes) {
-        digits += HEX_DIGITS[std::to_integer<unsigned>(b) >> 4];
-        digits += HEX_DIGITS[std::to_integer<unsigned>(b) & 0xF];
-    }
+    append_hex(digits, bytes);
     return digits;
 }
 

@@ -50,10 +50,20 @@ void append_escaped(std::string &to, std::string_view bytes) {
         }
 }
 
+/* How many characters at the start are shown as they are for certain; nearly all are. */
+std::size_t plain_length(std::string_view bytes, std::string_view slashed) {
+    auto is_plain = [slashed](char c) { return c >= ' ' && c <= '~' && slashed.find(c) == std::string_view::npos; };
+    return static_cast<std::size_t>(std::find_if_not(bytes.begin(), bytes.end(), is_plain) - bytes.begin());
+}
+
 /* slashed: characters that get a backslash. */
-std::string escaped(std::string_view bytes, std::string_view slashed) {
-    std::string shown;
-    while (!bytes.empty()) {
+void append_escaped(std::string &shown, std::string_view bytes, std::string_view slashed) {
+    for (;;) {
+        std::size_t plain = plain_length(bytes, slashed);
+        shown += bytes.substr(0, plain);
+        bytes.remove_prefix(plain);
+        if (bytes.empty())
+            return;
         std::string_view character = bytes.substr(0, length_or_1(bytes));
         if (slashed.find(character) != std::string_view::npos)
             shown += '\\';
@@ -63,7 +73,6 @@ std::string escaped(std::string_view bytes, std::string_view slashed) {
             append_escaped(shown, character);
         bytes.remove_prefix(character.size());
     }
-    return shown;
 }
 
 } // namespace
@@ -74,11 +83,21 @@ std::size_t printable_length(std::string_view bytes) {
 }
 
 std::string escaped(std::string_view bytes) {
-    return escaped(bytes, {});
+    std::string shown;
+    append_escaped(shown, bytes, {});
+    return shown;
+}
+
+void append_quoted(std::string &to, std::string_view bytes) {
+    to += '"';
+    append_escaped(to, bytes, "\"\\");
+    to += '"';
 }
 
 std::string quoted(std::string_view bytes) {
-    return '"' + escaped(bytes, "\"\\") + '"';
+    std::string shown;
+    append_quoted(shown, bytes);
+    return shown;
 }
 
 std::string escaped_ascii(std::string_view bytes) {

@@ -17,6 +17,7 @@ std::string escaped(std::string_view bytes);
 
 /* The same in double quotes, with quotes and backslashes escaped too. */
 std::string quoted(std::string_view bytes);
+void append_quoted(std::string &to, std::string_view bytes);
 
 /* Single quotes and backslashes get a backslash; everything that is not printable ASCII is written as \xNN. */
 std::string escaped_ascii(std::string_view bytes);

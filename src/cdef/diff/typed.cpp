@@ -24,7 +24,7 @@ facts::fact fact_of_number(std::uint32_t number, cdb::meaning as) {
 } // namespace
 
 void typed_values::append(const facts::fact &f) {
-    made += facts::json_of(f);
+    facts::append_json(made, f);
 }
 
 void typed_values::append_text(std::string_view text) {

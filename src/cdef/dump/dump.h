@@ -20,11 +20,12 @@ using facts::checksum;
 using facts::fact;
 using facts::fact_of;
 using facts::named;
+using facts::named_bits;
 using facts::none;
 using facts::word;
-using facts::words;
 
 /* As the listing shows it, on one line and free of bytes that a terminal would act upon. */
+void append(std::string &to, const fact &f);
 std::string as_text(const fact &f);
 
 /* ---- Fields ---------------------------------------------------------------------------------------------------- */
@@ -42,8 +43,8 @@ const cdb::bytes &lists_of(const cdb::class_tables &tables, cdb::target to);
 
 /* How a fact or a group of them is called. */
 struct label {
-    std::string_view key; /* in JSON; of no account in a list */
-    std::string title;    /* in the listing; empty: not shown there */
+    std::string_view key;   /* in JSON; of no account in a list */
+    std::string_view title; /* in the listing; empty: not shown there */
 };
 
 /* Takes the facts of a database in their order. Groups nest; a list's members are facts or groups without keys. */

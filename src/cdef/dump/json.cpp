@@ -26,11 +26,14 @@ public:
         to.close();
     }
     void add(const label &what, const fact &f) override {
-        to.add_json(what.key, facts::json_of(f));
+        value.clear();
+        facts::append_json(value, f);
+        to.add_json(what.key, value);
     }
 
 private:
     report::json_writer to{print};
+    std::string value; /* of the fact that is being added */
     bool first = true;
 };
 

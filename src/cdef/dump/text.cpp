@@ -7,62 +7,75 @@
 #include "text/number.h"
 #include "text/shown.h"
 
+#include <array>
+#include <charconv>
+
 namespace cdef::dump {
 
 namespace {
 
+/* Appends digits without making a text of its own. */
+template <class Number> void append_digits(std::string &to, Number number) {
+    std::array<char, 24> digits;
+    to.append(digits.data(), std::to_chars(digits.data(), digits.data() + digits.size(), number).ptr);
+}
+
 /* A fact's text, by its kind. */
-std::string text_of(none) {
-    return "none";
-}
-std::string text_of(std::int64_t number) {
-    return std::to_string(number);
-}
-std::string text_of(std::uint64_t number) {
-    return std::to_string(number);
-}
-std::string text_of(float number) {
-    return text::shortest(number);
-}
-std::string text_of(double number) {
-    return text::shortest(number);
-}
-std::string text_of(bits b) {
-    return text::hex(b.number);
-}
-std::string text_of(const word &w) {
-    return w.text;
-}
-std::string text_of(const words &w) {
-    std::string joined;
-    for (const std::string &item : w.list)
-        joined += (joined.empty() ? "" : ", ") + item;
-    if (joined.empty())
-        return "none";
-    return joined;
-}
-std::string text_of(any_text t) {
-    return text::quoted(t.bytes);
-}
-std::string text_of(binary b) {
-    return "0x" + text::hex_of(b.bytes);
-}
-std::string text_of(const vx_resource_handle_t &h) {
-    std::string shown;
-    text::appendf(shown, "0x%x 0x%x 0x%x 0x%x 0x%x", h.header, h.id.id1, h.id.id2, h.id.id3, h.id.id4);
-    return shown;
-}
-std::string text_of(const named &n) {
-    std::string shown = std::to_string(n.number) + ", ";
-    if (n.kind.empty())
-        return shown + "unknown";
-    return shown.append(n.kind) + " " + text::quoted(n.name);
-}
-std::string text_of(const checksum &c) {
-    if (c.found.empty())
-        return "correct";
-    return "wrong, " + c.found + " in the place of " + c.expected;
-}
+struct appender {
+    std::string &to;
+
+    void operator()(none) const {
+        to += "none";
+    }
+    void operator()(std::int64_t number) const {
+        append_digits(to, number);
+    }
+    void operator()(std::uint64_t number) const {
+        append_digits(to, number);
+    }
+    void operator()(float number) const {
+        to += text::shortest(number);
+    }
+    void operator()(double number) const {
+        to += text::shortest(number);
+    }
+    void operator()(bits b) const {
+        to += text::hex(b.number);
+    }
+    void operator()(const word &w) const {
+        to += w.text;
+    }
+    void operator()(const named_bits &b) const {
+        if (b.set == 0)
+            to += "none";
+        std::string_view comma;
+        facts::take_names(b, [&](std::string_view name) {
+            to.append(comma).append(name);
+            comma = ", ";
+        });
+    }
+    void operator()(any_text t) const {
+        text::append_quoted(to, t.bytes);
+    }
+    void operator()(binary b) const {
+        to += "0x";
+        text::append_hex(to, b.bytes);
+    }
+    void operator()(const vx_resource_handle_t &h) const {
+        text::appendf(to, "0x%x 0x%x 0x%x 0x%x 0x%x", h.header, h.id.id1, h.id.id2, h.id.id3, h.id.id4);
+    }
+    void operator()(const named &n) const {
+        append_digits(to, n.number);
+        to += ", ";
+        if (n.kind.empty())
+            to += "unknown";
+        else
+            text::append_quoted(to.append(n.kind).append(" "), n.name);
+    }
+    void operator()(const checksum &c) const {
+        to += c.found.empty() ? "correct" : "wrong, " + c.found + " in the place of " + c.expected;
+    }
+};
 
 /* One fact a line, two blanks a level. */
 class listing : public sink {
@@ -73,7 +86,9 @@ public:
         levels.push_back(!group.title.empty());
         if (group.title.empty())
             return;
-        line((coloured ? "\x1b[1m" : "") + group.title + (coloured ? "\x1b[0m" : ""));
+        begin_line();
+        out.text.append(coloured ? "\x1b[1m" : "").append(group.title).append(coloured ? "\x1b[0m" : "");
+        end_line();
         ++depth;
     }
     void open_list(const label &list) override {
@@ -84,16 +99,20 @@ public:
         levels.pop_back();
     }
     void add(const label &what, const fact &f) override {
-        if (!what.title.empty())
-            line(what.title + ": " + as_text(f));
+        if (what.title.empty())
+            return;
+        begin_line();
+        append(out.text.append(what.title).append(": "), f);
+        end_line();
     }
 
     output out;
 
 private:
-    void line(const std::string &shown) {
+    void begin_line() {
         out.text.append(depth * 2, ' ');
-        out.text += shown;
+    }
+    void end_line() {
         out.text += '\n';
         out.flush_if_full();
     }
@@ -105,8 +124,14 @@ private:
 
 } // namespace
 
+void append(std::string &to, const fact &f) {
+    std::visit(appender{to}, f);
+}
+
 std::string as_text(const fact &f) {
-    return std::visit([](const auto &some) { return text_of(some); }, f);
+    std::string text;
+    append(text, f);
+    return text;
 }
 
 void show_listing(const input &in, const readability &found, bool with_offsets, bool coloured) {

@@ -18,9 +18,11 @@ struct record_at {
     const cdb::record_format &format;
     cdb::bytes area;
     std::size_t at;
-    cdb::class_tables tables;
+    const cdb::class_tables &tables;
     vx_data_type_t type = VX_UNKNOWN; /* of its values, where the record itself does not name one */
 };
+
+constexpr cdb::class_tables NO_TABLES = {};
 
 using named_by_number = std::unordered_map<std::uint32_t, named>;
 
@@ -46,11 +48,12 @@ private:
     void show_variables(const cdb::variable_class &vc);
     void show_hash_blocks(const cdb::bytes &section);
 
-    void open(const record_at &r, std::string_view key, std::string title);
-    void show_record(const record_at &r, std::string_view key, const std::string &title);
+    void open(const record_at &r, std::string_view key, std::string_view title);
+    void show_record(const record_at &r, std::string_view key, std::string_view title);
     void show_fields(const record_at &r);
-    void show_number(const record_at &r, const cdb::field &f);
-    void show_reference(const record_at &r, const cdb::field &f);
+    void show_number(const record_at &r, const cdb::field &f, cdb::meaning as);
+    void show_reference(const record_at &r, const cdb::field &f, cdb::meaning as);
+    void show_reserved(const record_at &r, const cdb::field &f);
     void show_place(const record_at &r, const cdb::field &f);
     void show_list(const record_at &r, const cdb::field &f);
     void show_value(const label &what, const cdb::value &value, std::size_t cell, std::size_t strings);
@@ -68,6 +71,7 @@ private:
     /* Of several with one number, the first. */
     named_by_number variables; /* dynamic attributes, by variable ID */
     named_by_number managers;
+    std::string heading; /* of the record that is being opened */
 };
 
 /* The name of the field where a list's entries begin. */
@@ -76,7 +80,7 @@ std::string_view entries_of(const cdb::record_format &list) {
 }
 
 label same(std::string_view name) {
-    return {name, std::string(name)};
+    return {name, name};
 }
 
 /* ---- What numbers stand for ------------------------------------------------------------------------------------ */
@@ -114,11 +118,11 @@ std::size_t walker::place_of(const cdb::bytes &area) const {
 
 /* An array's elements are of one type, so they are told without it; those of structured data with it. */
 void walker::show_element(vx_data_type_t container, const cdb::value &element, std::size_t cell, std::size_t strings) {
-    std::string type(cdb::name_of(element.type()));
+    std::string_view type = cdb::name_of(element.type());
     if (container != VX_SD_PTR)
         return show_value({{}, type}, element, cell, strings);
     out.open({{}, {}});
-    out.add({"data_type", {}}, word{type});
+    out.add({"data_type", {}}, word{std::string(type)});
     show_value({"value", type}, element, cell + offsetof(vx_structured_data_element_t, value), strings);
     out.close();
 }
@@ -130,12 +134,13 @@ void walker::show_value(const label &what, const cdb::value &value, std::size_t 
         return out.add(what, none{});
     if (!holds_elements || !value.present())
         return out.add(what, fact_of(value));
-    std::string type(cdb::name_of(value.type()));
+    std::string_view type = cdb::name_of(value.type());
     cdb::value_list elements = value.elements();
-    std::string title = what.title;
+    std::string title(what.title);
     if (title != type)
-        title += ": " + type;
-    out.open_list({what.key, title + (elements.empty() ? ", empty" : "")});
+        title.append(": ").append(type);
+    title += elements.empty() ? ", empty" : "";
+    out.open_list({what.key, title});
     std::size_t element_size = value.type() == VX_SD_PTR ? sizeof(vx_structured_data_element_t) : sizeof(vx_value_t);
     std::size_t element_at = strings + *value.place() + cdb::value::ELEMENTS;
     for (std::size_t i = 0; i < elements.size(); ++i)
@@ -145,33 +150,37 @@ void walker::show_value(const label &what, const cdb::value &value, std::size_t 
 
 /* ---- Records --------------------------------------------------------------------------------------------------- */
 
-void walker::open(const record_at &r, std::string_view key, std::string title) {
+void walker::open(const record_at &r, std::string_view key, std::string_view title) {
+    heading = title;
     if (const cdb::field *name = r.format.name) {
         auto place = r.area.number<std::uint32_t>(r.at + name->offset);
         if (place != CDB_NONE)
-            title += " " + text::quoted(r.tables.strings.text(std::size_t{place}));
+            text::append_quoted(heading += ' ', r.tables.strings.text(std::size_t{place}));
     }
     if (!with_offsets)
-        return out.open({key, std::move(title)});
+        return out.open({key, heading});
     std::size_t at = place_of(r.area) + r.at;
-    out.open({key, title + " at " + std::to_string(at)});
+    heading.append(" at ").append(std::to_string(at));
+    out.open({key, heading});
     out.add({"at", {}}, std::uint64_t{at});
 }
 
-void walker::show_record(const record_at &r, std::string_view key, const std::string &title) {
+void walker::show_record(const record_at &r, std::string_view key, std::string_view title) {
     open(r, key, title);
     show_fields(r);
     out.close();
 }
 
+/* Each field has its row of meanings at its own position. */
 void walker::show_fields(const record_at &r) {
-    for (const cdb::field &f : r.format.fields)
+    for (std::size_t i = 0; i < r.format.fields.size(); ++i) {
+        const cdb::field &f = r.format.fields[i];
         switch (f.kind) {
         case cdb::field_kind::number:
-            show_number(r, f);
+            show_number(r, f, r.format.facts[i].as);
             break;
         case cdb::field_kind::reference:
-            show_reference(r, f);
+            show_reference(r, f, r.format.facts[i].as);
             break;
         case cdb::field_kind::value: {
             auto type = f.type_at == cdb::TYPE_OF_OWNER ? r.type : r.area.number<vx_data_type_t>(r.at + f.type_at);
@@ -179,34 +188,35 @@ void walker::show_fields(const record_at &r) {
                        place_of(r.area) + r.at + f.offset, place_of(r.tables.strings));
             break;
         }
-        case cdb::field_kind::reserved: {
-            auto raw = r.area.part(r.at + f.offset, std::size_t{f.width} * f.count).raw();
-            if (std::any_of(raw.begin(), raw.end(), [](std::byte b) { return b != std::byte{0}; }))
-                out.add(same(f.name), binary{raw});
+        case cdb::field_kind::reserved:
+            show_reserved(r, f);
             break;
-        }
         case cdb::field_kind::entries:
             break;
         }
+    }
 }
 
-void walker::show_number(const record_at &r, const cdb::field &f) {
-    cdb::meaning as = r.format.fact_of(f).as;
+void walker::show_reserved(const record_at &r, const cdb::field &f) {
+    auto raw = r.area.part(r.at + f.offset, std::size_t{f.width} * f.count).raw();
+    if (std::any_of(raw.begin(), raw.end(), [](std::byte b) { return b != std::byte{0}; }))
+        out.add(same(f.name), binary{raw});
+}
+
+void walker::show_number(const record_at &r, const cdb::field &f, cdb::meaning as) {
     std::uint32_t number = number_in(r.area, r.at, f);
-    fact shown = fact_of(as, number);
     if (as == cdb::meaning::CHECKSUM)
-        shown = sum;
+        return out.add(same(f.name), sum);
     if (as == cdb::meaning::OFFSET && !with_offsets)
         return;
-    if (as == cdb::meaning::LOCATOR && !std::holds_alternative<none>(shown))
-        shown = locator(r.tables, number);
+    if (as == cdb::meaning::LOCATOR && number != cdb::none_of(as))
+        return out.add(same(f.name), locator(r.tables, number));
     if (as == cdb::meaning::MANAGER)
-        shown = found_in(managers, number);
-    out.add(same(f.name), shown);
+        return out.add(same(f.name), found_in(managers, number));
+    out.add(same(f.name), fact_of(as, number));
 }
 
-void walker::show_reference(const record_at &r, const cdb::field &f) {
-    cdb::meaning as = r.format.fact_of(f).as;
+void walker::show_reference(const record_at &r, const cdb::field &f, cdb::meaning as) {
     auto place = r.area.number<std::uint32_t>(r.at + f.offset);
     if (as == cdb::meaning::OFFSET || as == cdb::meaning::UNUSED) {
         if (with_offsets || (as == cdb::meaning::UNUSED && place != 0))
@@ -228,8 +238,10 @@ void walker::show_place(const record_at &r, const cdb::field &f) {
     if (f.count == 1)
         return add(same(f.name), 0);
     out.open_list(same(f.name));
-    for (std::size_t i = 0; i < f.count; ++i)
-        add({{}, std::to_string(i)}, i);
+    for (std::size_t i = 0; i < f.count; ++i) {
+        std::string position = std::to_string(i);
+        add({{}, position}, i);
+    }
     out.close();
 }
 
@@ -241,7 +253,7 @@ void walker::show_list(const record_at &r, const cdb::field &f) {
     if (at == CDB_NONE || lists.number<std::uint32_t>(at) != kind.id || !owners.is_own(r.area, r.at + f.offset))
         return out.add(same(f.name), none{});
     record_at list = {*kind.head, lists, at, r.tables};
-    open(list, f.name, std::string(f.name));
+    open(list, f.name, f.name);
     show_fields(list);
     vx_data_type_t type = cdb::element_type(data_type_in(r.format, r.area, r.at));
     record_at entry = {*kind.entry, lists, at + cdb::LIST_HEAD, r.tables, type};
@@ -249,7 +261,7 @@ void walker::show_list(const record_at &r, const cdb::field &f) {
         cdb::count_inside(lists, entry.at, lists.number<std::uint32_t>(at + cdb::LIST_COUNT), entry.format.size);
     out.open_list({entries_of(*kind.head), {}});
     for (std::size_t i = 0; i < count; ++i, entry.at += entry.format.size)
-        show_record(entry, {}, std::string(kind.title));
+        show_record(entry, {}, kind.title);
     out.close();
     out.close();
 }
@@ -265,7 +277,7 @@ void walker::show_class_tables(const cdb::resource_class &rc) {
         std::size_t count = cdb::count_placed(section, record.*table.ref, record.*table.count, entry.format.size);
         out.open_list({table.key, {}});
         for (std::size_t i = 0; i < count; ++i, entry.at += entry.format.size)
-            show_record(entry, {}, std::string(table.title));
+            show_record(entry, {}, table.title);
         out.close();
     }
 }
@@ -278,7 +290,8 @@ void walker::show_variables(const cdb::variable_class &vc) {
 }
 
 void walker::show_hash_blocks(const cdb::bytes &section) {
-    record_at block = {cdb::format_for<rc_hash_block_t>, section, offsetof(rsrc_class_hash_t, rc_hash_blocks), {}};
+    record_at block = {cdb::format_for<rc_hash_block_t>, section, offsetof(rsrc_class_hash_t, rc_hash_blocks),
+                       NO_TABLES};
     auto told = section.number<std::uint32_t>(offsetof(rsrc_class_hash_t, rch_num_hash_blocks));
     std::size_t count = cdb::count_inside(section, block.at, told, block.format.size);
     out.open_list({entries_of(cdb::format_for<rsrc_class_hash_t>), {}});
@@ -288,8 +301,9 @@ void walker::show_hash_blocks(const cdb::bytes &section) {
 }
 
 void walker::show_root(std::size_t index, const cdb::section_kind &kind) {
-    record_at root = {*kind.root, db.section(index), 0, cdb::tables_of(db, index)};
-    open(root, kind.key, std::string(kind.title));
+    cdb::class_tables tables = cdb::tables_of(db, index);
+    record_at root = {*kind.root, db.section(index), 0, tables};
+    open(root, kind.key, kind.title);
     show_fields(root);
     if (kind.type == CDB_DSECT_CLASS)
         show_class_tables(cdb::resource_class(root.area));
@@ -303,7 +317,7 @@ void walker::show_root(std::size_t index, const cdb::section_kind &kind) {
 void walker::show_section(std::size_t index) {
     out.open({{}, "section"});
     std::size_t anchor_at = sizeof(orb_cdb_header_t) + index * sizeof(cdb_dsect_anchor_t);
-    show_fields({cdb::format_for<cdb_dsect_anchor_t>, db.file(), anchor_at, {}});
+    show_fields({cdb::format_for<cdb_dsect_anchor_t>, db.file(), anchor_at, NO_TABLES});
     if (const cdb::section_kind *kind = cdb::kind_of(db.anchor(index).cda_type))
         show_root(index, *kind);
     out.close();
@@ -314,7 +328,7 @@ void walker::show_file() {
     out.open({{}, {}});
     out.add({"byte_order", "byte order"}, word{db.order() == std::endian::big ? "big-endian" : "little-endian"});
     out.add({"size", "size"}, std::uint64_t{db.file().size()});
-    show_record({cdb::format_for<orb_cdb_header_t>, db.file(), 0, {}}, "header", "header");
+    show_record({cdb::format_for<orb_cdb_header_t>, db.file(), 0, NO_TABLES}, "header", "header");
     out.open_list({"sections", {}});
     for (std::size_t i = 0; i < db.section_count(); ++i)
         show_section(i);

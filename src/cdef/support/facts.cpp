@@ -12,6 +12,7 @@
 
 #include <nlohmann/json.hpp>
 
+#include <array>
 #include <charconv>
 #include <chrono>
 #include <cmath>
@@ -21,36 +22,6 @@ namespace cdef::facts {
 namespace {
 
 using enum cdb::meaning;
-
-/* The bits' names, the lowest first; what has no name follows as one number. */
-template <class NameOf> words names_of(std::uint32_t set, NameOf name_of) {
-    words names;
-    std::uint32_t unknown = 0;
-    for (std::uint32_t bit = 1; bit != 0; bit <<= 1) {
-        std::string name = (set & bit) != 0 ? name_of(bit) : std::string();
-        if (!name.empty())
-            names.list.push_back(std::move(name));
-        else
-            unknown |= set & bit;
-    }
-    if (unknown != 0)
-        names.list.push_back(text::hex(unknown));
-    return names;
-}
-
-words properties(std::span<const props_t> table, std::uint32_t set) {
-    return names_of(set, [table](std::uint32_t bit) {
-        auto found = std::find_if(table.begin(), table.end(), [bit](const props_t &p) { return p.p == bit; });
-        return std::string(found == table.end() ? "" : found->s);
-    });
-}
-
-words permissions(std::uint32_t set) {
-    return names_of(set, [](std::uint32_t bit) {
-        char letter = permission_letter(bit);
-        return letter == '\0' ? std::string() : std::string{letter};
-    });
-}
 
 /* The characters of a mark, the first one in the highest byte. */
 fact mark(std::uint32_t number) {
@@ -92,76 +63,103 @@ fact section_type(std::uint32_t number) {
 
 /* ---- JSON ------------------------------------------------------------------------------------------------------ */
 
-using json = nlohmann::ordered_json;
+template <class Number> void append_digits(std::string &to, Number number) {
+    std::array<char, 24> digits;
+    to.append(digits.data(), std::to_chars(digits.data(), digits.data() + digits.size(), number).ptr);
+}
 
-json json_of(none) {
-    return nullptr;
-}
-json json_of(std::int64_t number) {
-    return number;
-}
-json json_of(std::uint64_t number) {
-    return number;
-}
 /* What JSON has no number for becomes text. The number goes through its digits, so that 0.1 of 32 bits does not become
  * 0.10000000149011612. */
-template <class Real> json json_of_real(Real number) {
+template <class Real> void append_real(std::string &to, Real number) {
     std::string digits = text::shortest(number);
     if (!std::isfinite(number))
-        return digits;
+        return report::append_json(to, digits);
     double same = 0;
     std::from_chars(digits.data(), digits.data() + digits.size(), same);
-    return same;
-}
-json json_of(float number) {
-    return json_of_real(number);
-}
-json json_of(double number) {
-    return json_of_real(number);
-}
-json json_of(bits b) {
-    return b.number;
-}
-json json_of(const word &w) {
-    return w.text;
-}
-json json_of(const words &w) {
-    return w.list;
-}
-json json_of(binary b) {
-    json data;
-    data["bytes"] = text::hex_of(b.bytes);
-    return data;
-}
-json json_of(any_text t) {
-    return text::is_utf8(t.bytes) ? json(t.bytes) : json_of(binary{std::as_bytes(std::span(t.bytes))});
-}
-json json_of(const vx_resource_handle_t &h) {
-    json data;
-    data["header"] = h.header;
-    for (std::uint32_t part : {h.id.id1, h.id.id2, h.id.id3, h.id.id4})
-        data["id"].push_back(part);
-    return data;
-}
-json json_of(const named &n) {
-    bool known = !n.kind.empty();
-    json data;
-    data["number"] = n.number;
-    data["kind"] = known ? json(n.kind) : json();
-    data["name"] = known ? json_of(any_text{n.name}) : json();
-    return data;
-}
-json json_of(const checksum &c) {
-    json data;
-    data["correct"] = c.found.empty();
-    if (c.found.empty())
-        return data;
-    data["found"] = std::strtoul(c.found.c_str(), nullptr, 16);
-    data["expected"] = std::strtoul(c.expected.c_str(), nullptr, 16);
-    return data;
+    to += nlohmann::json(same).dump();
 }
 
+/* Appends a fact's value, by its kind. */
+struct appender {
+    std::string &to;
+
+    void operator()(none) const {
+        to += "null";
+    }
+    void operator()(std::int64_t number) const {
+        append_digits(to, number);
+    }
+    void operator()(std::uint64_t number) const {
+        append_digits(to, number);
+    }
+    void operator()(float number) const {
+        append_real(to, number);
+    }
+    void operator()(double number) const {
+        append_real(to, number);
+    }
+    void operator()(bits b) const {
+        append_digits(to, b.number);
+    }
+    void operator()(const word &w) const {
+        report::append_json(to, w.text);
+    }
+    void operator()(const named_bits &b) const {
+        to += '[';
+        std::string_view comma;
+        take_names(b, [&](std::string_view name) {
+            report::append_json(to += comma, name);
+            comma = ",";
+        });
+        to += ']';
+    }
+    void operator()(binary b) const {
+        to += "{\"bytes\":\"";
+        text::append_hex(to, b.bytes);
+        to += "\"}";
+    }
+    void operator()(any_text t) const {
+        if (text::is_utf8(t.bytes))
+            report::append_json(to, t.bytes);
+        else
+            (*this)(binary{std::as_bytes(std::span(t.bytes))});
+    }
+    void operator()(const vx_resource_handle_t &h) const {
+        text::appendf(to, "{\"header\":%u,\"id\":[%u,%u,%u,%u]}", h.header, h.id.id1, h.id.id2, h.id.id3, h.id.id4);
+    }
+    void operator()(const named &n) const {
+        bool known = !n.kind.empty();
+        append_digits(to += "{\"number\":", n.number);
+        to += ",\"kind\":";
+        known ? report::append_json(to, n.kind) : (*this)(none{});
+        to += ",\"name\":";
+        known ? (*this)(any_text{n.name}) : (*this)(none{});
+        to += '}';
+    }
+    void operator()(const checksum &c) const {
+        to += c.found.empty() ? "{\"correct\":true" : "{\"correct\":false,\"found\":";
+        if (!c.found.empty()) {
+            append_digits(to, std::strtoul(c.found.c_str(), nullptr, 16));
+            append_digits(to += ",\"expected\":", std::strtoul(c.expected.c_str(), nullptr, 16));
+        }
+        to += '}';
+    }
+};
+
 } // namespace
+
+std::string_view name_of_bit(cdb::meaning as, std::uint32_t bit) {
+    if (as == PERMISSIONS) {
+        for (const valid_perms_t &known : perm_list)
+            if (known.mask == bit)
+                return {&known.permission, 1};
+        return {};
+    }
+    for (const props_t &known : cdb::properties_of(as))
+        if (known.p == bit)
+            return known.s;
+    return {};
+}
 
 fact fact_of(cdb::meaning as, std::uint32_t number) {
     if (number == cdb::none_of(as))
@@ -182,9 +180,8 @@ fact fact_of(cdb::meaning as, std::uint32_t number) {
     case PERSISTENT_PROPERTIES:
     case DYNAMIC_PROPERTIES:
     case ACTION_PROPERTIES:
-        return properties(cdb::properties_of(as), number);
     case PERMISSIONS:
-        return permissions(number);
+        return named_bits{as, number};
     case DATA_TYPE:
         return name_in(vxTypeStr, number);
     case VARIABLE_TYPE:
@@ -228,8 +225,8 @@ fact fact_of(const cdb::value &value) {
     }
 }
 
-std::string json_of(const fact &f) {
-    return report::json_line(std::visit([](const auto &some) { return json_of(some); }, f));
+void append_json(std::string &to, const fact &f) {
+    std::visit(appender{to}, f);
 }
 
 } // namespace cdef::facts

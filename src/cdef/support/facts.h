@@ -4,12 +4,12 @@
 
 #include "cdb_view.h"
 #include "format/facts.h"
+#include "text/hex.h"
 
 #include <span>
 #include <string>
 #include <string_view>
 #include <variant>
-#include <vector>
 
 namespace cdef::facts {
 
@@ -20,9 +20,10 @@ struct word {
     std::string text;
 };
 
-/* A set of words, perhaps empty. */
-struct words {
-    std::vector<std::string> list;
+/* A set of bits, each of which may have a name: properties or permissions. */
+struct named_bits {
+    cdb::meaning as;
+    std::uint32_t set;
 };
 
 /* Text from the file: any bytes. */
@@ -52,7 +53,7 @@ struct checksum {
     std::string expected;
 };
 
-using fact = std::variant<none, std::int64_t, std::uint64_t, float, double, bits, word, words, any_text, binary,
+using fact = std::variant<none, std::int64_t, std::uint64_t, float, double, bits, word, named_bits, any_text, binary,
                           vx_resource_handle_t, named, checksum>;
 
 /* What a number means as far as it can be told from the number alone. */
@@ -62,7 +63,25 @@ fact fact_of(cdb::meaning as, std::uint32_t number);
 fact fact_of(const cdb::value &value);
 
 /* On one line, in ASCII only. docs/dump.md says which fact has which form. */
-std::string json_of(const fact &f);
+void append_json(std::string &to, const fact &f);
+
+/* The name of one of the bits; empty if it has none. The text is never freed. */
+std::string_view name_of_bit(cdb::meaning as, std::uint32_t bit);
+
+/* Passes the names of the bits to take(std::string_view), the lowest bit first. What has no name follows as one number
+ * in hexadecimal. */
+template <class Take> void take_names(const named_bits &bits, Take take) {
+    std::uint32_t unknown = 0;
+    for (std::uint32_t rest = bits.set; rest != 0; rest &= rest - 1) {
+        std::uint32_t bit = rest & -rest;
+        if (std::string_view name = name_of_bit(bits.as, bit); !name.empty())
+            take(name);
+        else
+            unknown |= bit;
+    }
+    if (unknown != 0)
+        take(text::hex(unknown));
+}
 
 } // namespace cdef::facts
 

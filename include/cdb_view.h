@@ -302,6 +302,9 @@ std::span<const rule> rules();
  */
 std::vector<region> regions(const database &db);
 
+/** The same, but hands over each region as soon as those before it are known. */
+void regions(const database &db, const std::function<void(const region &)> &take);
+
 } // namespace cdb
 
 #endif

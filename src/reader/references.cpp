@@ -109,12 +109,11 @@ bool reference_walk::claim_list(const location &list_at, std::size_t count, exte
     std::size_t held = count == 0 && lists.area.size() - first >= kind.entry->size ? 1 : count;
     if (lists.claim(list_at.index, LIST_HEAD + held * kind.entry->size) != extent::claim_result::FIRST)
         return false;
-    for (const field &f : kind.head->fields.first(kind.head->fields.size() - 1))
-        out.add_region(list_at, list_at.offset + f.offset, f.width, kind.head->record, &f);
+    out.add_region(list_at, list_at.offset, kind.head->size, kind_of_record(*kind.head));
     if (count < held) {
         location room_at = {section, kind.head->record, list_at.index, list_at.offset + LIST_HEAD};
         out.expect_zero(room_at, "filling", lists.area, first, kind.entry->size, room_at.offset);
-        out.add_region(room_at, room_at.offset, kind.entry->size, "filling");
+        out.add_region(room_at, room_at.offset, kind.entry->size, stretch_kind::FILLING);
     }
     return true;
 }

@@ -32,12 +32,4 @@ void reporter::report_reserved(const location &at, std::string_view field, std::
     report(check::RESERVED, at, field, file_offset + distance, text::hex(std::to_integer<unsigned>(*wrong)), "0x0");
 }
 
-void reporter::add_regions(const location &at, const bytes &area, std::size_t offset, std::span<const field> fields) {
-    for (const field &f : fields) {
-        std::size_t size = std::size_t{f.width} * f.count;
-        if (f.kind != field_kind::entries && area.holds(offset + f.offset, size))
-            add_region(at, at.offset + f.offset, size, at.record, &f);
-    }
-}
-
 } // namespace cdb

@@ -4,6 +4,7 @@
 #define CDGEN_READER_REPORT_H
 
 #include "reader/fields.h"
+#include "reader/region_map.h"
 #include "reader/rules.h"
 
 namespace cdb {
@@ -29,7 +30,7 @@ using finding_taker = std::function<void(finding &&)>;
 class reporter {
 public:
     /* map: null if no regions are wanted. */
-    reporter(const finding_taker &to, std::vector<region> *map) : take(to), regions(map) {}
+    reporter(const finding_taker &to, region_map *map) : take(to), regions(map) {}
 
     /* offset: in the file. */
     void report(check broken, const location &at, std::string_view field, std::size_t offset, std::string found,
@@ -46,19 +47,19 @@ public:
         report(broken, at, f.name, at.offset + f.offset, found, expected);
     }
 
-    void add_region(const location &at, std::size_t offset, std::size_t size, std::string_view name,
-                    const field *what = nullptr) {
+    /* kind: as in stretch_kind. */
+    void add_region(const location &at, std::size_t offset, std::size_t size, std::uint8_t kind) {
         if (regions != nullptr && size > 0)
-            regions->push_back({offset, size, at.section, name, at.index, what});
+            regions->add(kind, offset, size, at.index);
     }
 
     /* Adds the regions of a record's fields, and reports reserved ones that are not zero. A list's entries are not part
-     * of it. offset: of the record in the area. */
+     * of it. offset: of the record in the area, which must hold all of it. */
     template <class Record> void visit(const location &at, const bytes &area, std::size_t offset) {
+        constexpr std::uint8_t KIND = kind_of_record(format_for<Record>);
         for (const field &f : reserved_fields_of<Record>)
             expect_zero(at, f.name, area, offset + f.offset, std::size_t{f.width} * f.count, at.offset + f.offset);
-        if (regions != nullptr)
-            add_regions(at, area, offset, fields_of<Record>);
+        add_region(at, at.offset, format_for<Record>.size, KIND);
     }
     void expect_id(const location &at, std::string_view field, vx_uint32_t found, vx_uint32_t expected) {
         if (found != expected)
@@ -78,10 +79,9 @@ private:
     void report_id(const location &at, std::string_view field, vx_uint32_t found, vx_uint32_t expected);
     void report_reserved(const location &at, std::string_view field, std::span<const std::byte> stretch,
                          std::size_t file_offset);
-    void add_regions(const location &at, const bytes &area, std::size_t offset, std::span<const field> fields);
 
     const finding_taker &take;
-    std::vector<region> *regions;
+    region_map *regions;
 };
 
 } // namespace cdb

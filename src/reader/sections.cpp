@@ -53,7 +53,7 @@ static void walk_variable_ids(reporter &out, const location &record_at, const by
     std::size_t count = count_inside(section, first, told, sizeof(var_id_t));
     location at = {record_at.section, "var_id_t", 0, record_at.offset + start};
     for (; at.index < count; ++at.index, at.offset += sizeof(var_id_t)) {
-        out.add_region(at, at.offset, sizeof(var_id_t), at.record);
+        out.add_region(at, at.offset, sizeof(var_id_t), stretch_kind::VARIABLE_ID);
         auto id = section.number<var_id_t>(at.offset - record_at.offset);
         if (!std::binary_search(dynamic_ids.begin(), dynamic_ids.end(), id))
             out.report(check::VARIABLE_ID, at, {}, at.offset, std::to_string(id), "the ID of a dynamic attribute");
@@ -61,7 +61,7 @@ static void walk_variable_ids(reporter &out, const location &record_at, const by
     std::size_t end = at.offset - record_at.offset;
     std::size_t filling = static_cast<std::size_t>(std::min<std::uint64_t>(section.size(), first + filled)) - end;
     out.expect_zero(at, "filling", section, end, filling, at.offset);
-    out.add_region(at, at.offset, filling, "filling");
+    out.add_region(at, at.offset, filling, stretch_kind::FILLING);
 }
 
 void walk_variable_class(reporter &out, const location &at, const bytes &section,

@@ -44,14 +44,14 @@ void text_walk::note(std::size_t offset) {
 void text_walk::claim(std::size_t start, std::size_t end) {
     auto [size, whole] = strings.claim_text(start, end);
     location text = {section, "text", 0, strings.offset + start};
-    out.add_region(text, text.offset, size, text.record);
+    out.add_region(text, text.offset, size, stretch_kind::TEXT);
     if (!whole)
         return out.report(check::VALUE_SHARED, text, {}, text.offset, "a text that runs into something else",
                           "a place of its own");
     std::size_t filled = std::min(end, extent::rounded(start + size));
     std::size_t filling = filled - start - size;
     out.expect_zero(text, "filling", strings.area, start + size, filling, text.offset + size);
-    out.add_region(text, text.offset + size, filling, "filling");
+    out.add_region(text, text.offset + size, filling, stretch_kind::FILLING);
 }
 
 void text_walk::finish() {

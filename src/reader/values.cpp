@@ -59,7 +59,7 @@ void value_walk::walk_text(const cell_location &cell, std::size_t offset) {
 void value_walk::walk_filling(const location &place, std::size_t end) {
     std::size_t rounded = std::min(extent::rounded(end), strings.area.size());
     out.expect_zero(place, "filling", strings.area, end, rounded - end, strings.offset + end);
-    out.add_region(place, strings.offset + end, rounded - end, "filling");
+    out.add_region(place, strings.offset + end, rounded - end, stretch_kind::FILLING);
 }
 
 /* The length and the bytes are two pieces. */
@@ -68,9 +68,9 @@ void value_walk::walk_binary(const cell_location &cell, std::size_t offset) {
     if (!claim(cell, offset, value::BINARY_BYTES + std::uint64_t{length}))
         return;
     location binary = {section, "binary", 0, strings.offset + offset};
-    out.add_region(binary, binary.offset, sizeof(vx_uint32_t), "length");
+    out.add_region(binary, binary.offset, sizeof(vx_uint32_t), stretch_kind::LENGTH);
     walk_filling(binary, offset + sizeof(vx_uint32_t));
-    out.add_region(binary, binary.offset + value::BINARY_BYTES, length, "binary");
+    out.add_region(binary, binary.offset + value::BINARY_BYTES, length, stretch_kind::BINARY);
     walk_filling(binary, offset + value::BINARY_BYTES + length);
     if (length == 0)
         empty_binaries.push_back(offset + value::BINARY_BYTES);
@@ -81,7 +81,8 @@ void value_walk::finish_empty_binaries() {
     for (std::size_t piece : empty_binaries) {
         auto raw = strings.area.part(piece, UNIT).raw();
         if (raw.size() == UNIT && all_zero(raw) && strings.claim(piece, UNIT) == extent::claim_result::FIRST)
-            out.add_region({section, "binary", 0, strings.offset + piece}, strings.offset + piece, UNIT, "filling");
+            out.add_region({section, "binary", 0, strings.offset + piece}, strings.offset + piece, UNIT,
+                           stretch_kind::FILLING);
     }
 }
 
@@ -90,7 +91,7 @@ void value_walk::walk_handle(const cell_location &cell, std::size_t offset) {
     if (!claim(cell, offset, SIZE))
         return;
     location handle = {section, "handle", 0, strings.offset + offset};
-    out.add_region(handle, handle.offset, SIZE, "handle");
+    out.add_region(handle, handle.offset, SIZE, stretch_kind::HANDLE);
     walk_filling(handle, offset + SIZE);
 }
 
@@ -102,7 +103,7 @@ void value_walk::walk_array(const cell_location &cell, std::size_t offset, vx_da
     out.visit<vx_array_t>(array, strings.area, offset);
     location element = {section, "vx_value_t", 0, array.offset + value::ELEMENTS};
     for (; element.index < count; ++element.index, element.offset += sizeof(vx_value_t)) {
-        out.add_region(element, element.offset, sizeof(vx_value_t), element.record);
+        out.add_region(element, element.offset, sizeof(vx_value_t), stretch_kind::VALUE);
         if (is_out_of_line(element_type(type)))
             walk_element(element, strings.area.number<std::uint32_t>(element.offset - strings.offset),
                          element_type(type));
@@ -130,7 +131,7 @@ void value_walk::walk_structured_data(const cell_location &cell, std::size_t off
     location element = {section, "vx_structured_data_element_t", 0, sd.offset + value::ELEMENTS};
     if (count == 0) {
         out.expect_zero(element, "filling", strings.area, offset + value::ELEMENTS, SIZE, element.offset);
-        out.add_region(element, element.offset, SIZE, "filling");
+        out.add_region(element, element.offset, SIZE, stretch_kind::FILLING);
     }
     for (; element.index < count; ++element.index, element.offset += SIZE) {
         std::size_t in_strings = element.offset - strings.offset;

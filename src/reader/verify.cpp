@@ -15,22 +15,25 @@ namespace {
 class file_walk {
 public:
     /* map: null if no regions are wanted. */
-    file_walk(const database &walked, const finding_taker &to, std::vector<region> *map)
-        : db(walked), out(to, map), last_class(find_last_class(walked)) {}
+    file_walk(const database &walked, const finding_taker &to, region_map *map)
+        : db(walked), out(to, map), regions(map), last_class(find_last_class(walked)) {}
 
     void run();
 
 private:
     static std::size_t find_last_class(const database &db);
+    void add_beginning(std::size_t anchors);
     void walk_anchors();
     void walk_anchor(std::size_t index);
     bool place_section(const location &at, const cdb_dsect_anchor_t &anchor);
     void walk_section(const location &anchor_at, const cdb_dsect_anchor_t &anchor, const section_kind &kind);
+    void walk_whole_section(cdb_dsect_type_t type, const location &at, const bytes &section);
     void walk_section_of(cdb_dsect_type_t type, const location &at, const bytes &section);
     std::span<const var_id_t> sorted_ids();
 
     const database &db;
     reporter out;
+    region_map *regions;               /* null: none are wanted */
     std::size_t last_class;            /* position of the last class among the anchors */
     std::size_t sections_end = 0;      /* where the sections walked so far end, in the file */
     int section_rank = 0;              /* the highest so far, in the order of types */
@@ -69,7 +72,6 @@ void file_walk::walk_anchor(std::size_t index) {
                    .record = "cdb_dsect_anchor_t",
                    .index = index,
                    .offset = sizeof(orb_cdb_header_t) + index * sizeof(cdb_dsect_anchor_t)};
-    out.visit<cdb_dsect_anchor_t>(at, db.file(), at.offset);
     cdb_dsect_anchor_t anchor = db.anchor(index);
     if (!place_section(at, anchor))
         return;
@@ -81,6 +83,14 @@ void file_walk::walk_anchor(std::size_t index) {
                "3 to 7");
 }
 
+/* The regions of the header and the anchors, which come before all sections. */
+void file_walk::add_beginning(std::size_t anchors) {
+    constexpr std::uint8_t ANCHOR = kind_of_record(format_for<cdb_dsect_anchor_t>);
+    for (std::size_t i = 0; i < anchors; ++i)
+        regions->add(ANCHOR, sizeof(orb_cdb_header_t) + i * sizeof(cdb_dsect_anchor_t), sizeof(cdb_dsect_anchor_t), i);
+    regions->finish_part();
+}
+
 void file_walk::walk_anchors() {
     std::size_t count = db.section_count();
     if (count < db.header().cdb_hdr_dsect_count)
@@ -88,6 +98,8 @@ void file_walk::walk_anchors() {
                    field_of<orb_cdb_header_t>(offsetof(orb_cdb_header_t, cdb_hdr_dsect_count)),
                    db.header().cdb_hdr_dsect_count, count);
     sections_end = sizeof(orb_cdb_header_t) + count * sizeof(cdb_dsect_anchor_t);
+    if (regions != nullptr)
+        add_beginning(count);
     for (std::size_t i = 0; i < count; ++i)
         walk_anchor(i);
     if (sections_end != db.file().size())
@@ -107,8 +119,16 @@ void file_walk::walk_section(const location &anchor_at, const cdb_dsect_anchor_t
                    field_of<cdb_dsect_anchor_t>(offsetof(cdb_dsect_anchor_t, cda_length)),
                    std::to_string(anchor.cda_length), "at least " + std::to_string(kind.root->size));
     else
-        walk_section_of(kind.type, {anchor_at.section, kind.root->record, 0, anchor.cda_offset},
-                        db.file().part(anchor.cda_offset, anchor.cda_length));
+        walk_whole_section(kind.type, {anchor_at.section, kind.root->record, 0, anchor.cda_offset},
+                           db.file().part(anchor.cda_offset, anchor.cda_length));
+}
+
+void file_walk::walk_whole_section(cdb_dsect_type_t type, const location &at, const bytes &section) {
+    if (regions != nullptr)
+        regions->begin_part(at.section, at.offset);
+    walk_section_of(type, at, section);
+    if (regions != nullptr)
+        regions->finish_part();
 }
 
 /* A variable class may refer to the attributes of classes before the first variable class only. */
@@ -139,10 +159,14 @@ std::span<const var_id_t> file_walk::sorted_ids() {
 }
 
 void file_walk::run() {
-    if (!check_header(out, db))
-        return;
-    walk_anchors();
-    check_largest_ids(out, db);
+    if (check_header(out, db)) {
+        walk_anchors();
+        check_largest_ids(out, db);
+    }
+    if (regions != nullptr) {
+        regions->finish_part();
+        regions->finish();
+    }
 }
 
 } // namespace
@@ -162,28 +186,15 @@ bool is_sound(std::span<const finding> findings) {
                         [](const finding &f) { return f.broken->level == severity::error; });
 }
 
-/* In a damaged file two regions may overlap: the one that starts first counts, and of two that start together the
- * longer one. */
-std::vector<region> regions(const database &db) {
-    std::vector<region> seen, all;
+void regions(const database &db, const std::function<void(const region &)> &take) {
     finding_taker ignore = [](finding &&) {};
-    file_walk(db, ignore, &seen).run();
-    std::stable_sort(seen.begin(), seen.end(), [](const region &a, const region &b) {
-        return a.offset != b.offset ? a.offset < b.offset : a.size > b.size;
-    });
-    std::size_t end = 0;
-    auto fill = [&](std::size_t to) {
-        if (to > end)
-            all.push_back({end, to - end, std::nullopt, "unreached", 0, nullptr});
-    };
-    for (const region &r : seen) {
-        if (r.offset < end)
-            continue;
-        fill(r.offset);
-        all.push_back(r);
-        end = r.offset + r.size;
-    }
-    fill(db.file().size());
+    region_map map(db.file().size(), take);
+    file_walk(db, ignore, &map).run();
+}
+
+std::vector<region> regions(const database &db) {
+    std::vector<region> all;
+    regions(db, [&all](const region &r) { all.push_back(r); });
     return all;
 }
 

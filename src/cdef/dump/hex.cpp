@@ -9,7 +9,8 @@
 #include "text/append.h"
 #include "text/shown.h"
 
-#include <unordered_map>
+#include <array>
+#include <charconv>
 
 namespace cdef::dump {
 
@@ -18,65 +19,98 @@ namespace {
 constexpr std::size_t BYTES_A_LINE = 16;
 constexpr std::size_t EXCERPT = 32; /* bytes of a text that a reference shows */
 
-/* Whether a field's bytes say what the place of its record starts with. */
-bool starts(const cdb::region &r, std::string_view record) {
-    return r.what != nullptr && r.what->offset == 0 && r.record == record;
-}
+/* The types of values that are stored at places in the file: of lists of valid values, or of the elements of arrays.
+ * They are noted in any order and looked up in the order of the file. The first note of a place counts. */
+class types_by_place {
+public:
+    void note(std::size_t place, vx_data_type_t type) {
+        notes.push_back(std::uint64_t{place} << TYPE_BITS | static_cast<std::uint8_t>(type));
+    }
+    void sort() {
+        std::stable_sort(notes.begin(), notes.end(),
+                         [](std::uint64_t a, std::uint64_t b) { return a >> TYPE_BITS < b >> TYPE_BITS; });
+    }
+    /* VX_UNKNOWN if there is no note. */
+    vx_data_type_t at(std::size_t place) const {
+        std::uint64_t wanted = std::uint64_t{place} << TYPE_BITS;
+        auto found = std::lower_bound(notes.begin(), notes.end(), wanted,
+                                      [](std::uint64_t a, std::uint64_t b) { return a >> TYPE_BITS < b >> TYPE_BITS; });
+        bool is_noted = found != notes.end() && *found >> TYPE_BITS == place;
+        return is_noted ? static_cast<vx_data_type_t>(*found & 0xFF) : VX_UNKNOWN;
+    }
+
+private:
+    static constexpr int TYPE_BITS = 8;
+
+    std::vector<std::uint64_t> notes; /* place and type */
+};
 
 class hex_form {
 public:
-    explicit hex_form(const cdb::database &shown)
-        : db(shown), owners(cdb::owners_in(shown)), sections(shown.section_count()) {}
+    explicit hex_form(const cdb::database &shown) : db(shown), owners(cdb::owners_in(shown)) {}
 
     void show();
 
 private:
-    using types_by_place = std::unordered_map<std::size_t, vx_data_type_t>;
-
     void note_types(const cdb::region &r);
     void show(const cdb::region &r);
-    std::string meaning_in(const cdb::region &r);
-    std::string meaning_of_field(const cdb::region &r);
-    std::string meaning_of_reference(const cdb::region &r);
-    std::string meaning_of_value(const cdb::region &r, vx_data_type_t type);
+    void show_line(const cdb::region &r, std::size_t at);
+    void append_name(const cdb::region &r);
+    /* Each appends ": " and what the bytes mean, or nothing. */
+    void append_meaning(const cdb::region &r);
+    void append_field(const cdb::region &r);
+    void append_reference(const cdb::region &r);
+    void append_value(const cdb::region &r, vx_data_type_t type);
     vx_data_type_t value_type(const cdb::region &r) const;
 
+    std::string &meaning() {
+        return out.text += ": ";
+    }
+    void append_place(const cdb::bytes &area, std::size_t at);
+    void append_excerpt(const cdb::bytes &strings, std::size_t at);
+
+    const cdb::record_format &format(const cdb::region &r);
+    cdb::meaning meaning_of(const cdb::region &r);
     const cdb::class_tables &tables(const cdb::region &r);
     std::size_t place_of(const cdb::bytes &area) const;
-    std::string place_text(const cdb::bytes &area, std::size_t at) const;
 
     const cdb::database &db;
     cdb::ownership owners;
-    std::vector<std::optional<cdb::class_tables>> sections; /* as far as they have been asked for */
-    types_by_place lists;                                   /* of valid values, by where they stand in the file */
-    types_by_place arrays;                                  /* of their elements, likewise */
-    vx_data_type_t list_type = VX_UNKNOWN;                  /* of the list that the regions are in */
-    vx_data_type_t array_type = VX_UNKNOWN;                 /* of the array, likewise */
+    std::optional<std::size_t> known_section; /* the one that known_tables are of */
+    cdb::class_tables known_tables;
+    const cdb::record_format *known_format = &cdb::format_for<void>;
+    types_by_place lists;
+    types_by_place arrays;
+    vx_data_type_t list_type = VX_UNKNOWN;  /* of the list that the regions are in */
+    vx_data_type_t array_type = VX_UNKNOWN; /* of the array, likewise */
     output out;
 };
-
-vx_data_type_t type_at(const std::unordered_map<std::size_t, vx_data_type_t> &types, std::size_t place) {
-    auto found = types.find(place);
-    return found == types.end() ? VX_UNKNOWN : found->second;
-}
-
-/* What the field of a region means. */
-const cdb::field_fact &fact_row(const cdb::region &r) {
-    return cdb::format_of(r.record).fact_of(*r.what);
-}
 
 /* Where a record begins in the file. */
 std::size_t start_of(const cdb::region &r) {
     return r.offset - r.what->offset;
 }
 
-/* Of a region in a section: values and references stand nowhere else. */
+/* Regions of one record follow each other. */
+const cdb::record_format &hex_form::format(const cdb::region &r) {
+    if (known_format->record.data() != r.record.data())
+        known_format = &cdb::format_of(r.record);
+    return *known_format;
+}
+
+/* Each field has its row at its own position. */
+cdb::meaning hex_form::meaning_of(const cdb::region &r) {
+    const cdb::record_format &of = format(r);
+    return of.facts[static_cast<std::size_t>(r.what - of.fields.data())].as;
+}
+
+/* Of a region in a section: values and references are stored nowhere else. */
 const cdb::class_tables &hex_form::tables(const cdb::region &r) {
-    std::size_t section = r.section.value();
-    std::optional<cdb::class_tables> &known = sections.at(section);
-    if (!known)
-        known = cdb::tables_of(db, section);
-    return *known;
+    if (known_section != r.section) {
+        known_tables = cdb::tables_of(db, r.section.value());
+        known_section = r.section;
+    }
+    return known_tables;
 }
 
 /* area: of the file, and not empty. */
@@ -84,29 +118,46 @@ std::size_t hex_form::place_of(const cdb::bytes &area) const {
     return static_cast<std::size_t>(area.raw().data() - db.file().raw().data());
 }
 
+void append_number(std::string &to, std::uint64_t number) {
+    std::array<char, 24> digits;
+    to.append(digits.data(), std::to_chars(digits.data(), digits.data() + digits.size(), number).ptr);
+}
+
+/* At least eight digits. */
+void append_offset(std::string &to, std::size_t offset) {
+    constexpr int DIGIT = 4;
+    int shift = 28;
+    while (shift < 60 && offset >> (shift + DIGIT) != 0)
+        shift += DIGIT;
+    for (; shift >= 0; shift -= DIGIT)
+        to += text::HEX_DIGITS[offset >> shift & 0xF];
+}
+
 /* An offset into an area, and where that is in the file. */
-std::string hex_form::place_text(const cdb::bytes &area, std::size_t at) const {
-    std::string shown = std::to_string(at);
+void hex_form::append_place(const cdb::bytes &area, std::size_t at) {
+    append_number(out.text, at);
     if (at < area.size())
-        text::appendf(shown, " at %08zx", place_of(area) + at);
-    return shown;
+        append_offset(out.text += " at ", place_of(area) + at);
 }
 
 /* Lists of valid values and arrays do not name the types of their values; the record that owns them does. */
 void hex_form::note_types(const cdb::region &r) {
-    if (r.what == nullptr || !r.section || !owners.is_own(r.offset))
+    if (r.what == nullptr || !r.section)
+        return;
+    bool is_value = r.what->kind == cdb::field_kind::value;
+    if ((!is_value && r.what->to != cdb::target::valid_vals) || !owners.is_own(r.offset))
         return;
     auto word = db.file().number<std::uint32_t>(r.offset);
-    if (r.what->kind == cdb::field_kind::value) {
+    if (is_value) {
         vx_data_type_t type = value_type(r);
         const cdb::bytes &strings = tables(r).strings;
         if (cdb::is_array(type) && word < strings.size())
-            arrays.try_emplace(place_of(strings) + word, cdb::element_type(type));
-    } else if (r.what->to == cdb::target::valid_vals) {
+            arrays.note(place_of(strings) + word, cdb::element_type(type));
+    } else {
         const cdb::bytes &table = tables(r).valid_vals;
-        vx_data_type_t type = data_type_in(cdb::format_of(r.record), db.file(), start_of(r));
+        vx_data_type_t type = data_type_in(format(r), db.file(), start_of(r));
         if (word < table.size())
-            lists.try_emplace(place_of(table) + word, cdb::element_type(type));
+            lists.note(place_of(table) + word, cdb::is_data_type(type) ? cdb::element_type(type) : VX_UNKNOWN);
     }
 }
 
@@ -116,9 +167,10 @@ vx_data_type_t hex_form::value_type(const cdb::region &r) const {
 }
 
 /* The beginning of a text. */
-std::string excerpt(const cdb::bytes &strings, std::size_t at) {
+void hex_form::append_excerpt(const cdb::bytes &strings, std::size_t at) {
     std::string_view text = strings.part(at, EXCERPT + 1).text(std::size_t{0});
-    return text::quoted(text.substr(0, EXCERPT)) + (text.size() > EXCERPT ? "..." : "");
+    text::append_quoted(out.text += ' ', text.substr(0, EXCERPT));
+    out.text += text.size() > EXCERPT ? "..." : "";
 }
 
 vx_resource_handle_t handle_at(const cdb::bytes &file, std::size_t at) {
@@ -126,115 +178,125 @@ vx_resource_handle_t handle_at(const cdb::bytes &file, std::size_t at) {
     return {word(0), {word(1), word(2), word(3), word(4)}};
 }
 
-std::string hex_form::meaning_of_value(const cdb::region &r, vx_data_type_t type) {
+void hex_form::append_value(const cdb::region &r, vx_data_type_t type) {
     const cdb::bytes &strings = tables(r).strings;
     cdb::value value(db.file(), r.offset, type, strings);
-    if (!cdb::is_out_of_line(type) && !value.present())
-        return "";
-    if (!cdb::is_out_of_line(type))
-        return as_text(fact_of(value));
+    if (!cdb::is_out_of_line(type)) {
+        if (value.present())
+            append(meaning(), fact_of(value));
+        return;
+    }
     auto word = db.file().number<std::uint32_t>(r.offset);
-    if (word == CDB_NONE)
-        return "none";
-    std::string shown = place_text(strings, word);
+    meaning();
+    if (word == CDB_NONE) {
+        out.text += "none";
+        return;
+    }
+    append_place(strings, word);
     if (type == VX_CHAR_PTR && value.present())
-        shown += " " + excerpt(strings, word);
-    return shown;
+        append_excerpt(strings, word);
 }
 
-std::string hex_form::meaning_of_reference(const cdb::region &r) {
+void hex_form::append_reference(const cdb::region &r) {
     auto word = db.file().number<std::uint32_t>(r.offset);
     if (r.what->count > 1)
-        return "";
+        return;
+    meaning();
     if (word == CDB_NONE)
-        return "none";
-    if (r.what->to == cdb::target::none || fact_row(r).as == cdb::meaning::UNUSED)
-        return std::to_string(word);
-    const cdb::class_tables &into = tables(r);
-    if (r.what->to == cdb::target::section)
-        return place_text(into.section, word);
-    if (r.what->to != cdb::target::strings)
-        return place_text(lists_of(into, r.what->to), word);
-    std::string shown = place_text(into.strings, word);
-    if (word < into.strings.size())
-        shown += " " + excerpt(into.strings, word);
-    return shown;
+        out.text += "none";
+    else if (r.what->to == cdb::target::none || meaning_of(r) == cdb::meaning::UNUSED)
+        append_number(out.text, word);
+    else if (r.what->to == cdb::target::section)
+        append_place(tables(r).section, word);
+    else if (r.what->to != cdb::target::strings)
+        append_place(lists_of(tables(r), r.what->to), word);
+    else {
+        append_place(tables(r).strings, word);
+        if (word < tables(r).strings.size())
+            append_excerpt(tables(r).strings, word);
+    }
 }
 
-std::string hex_form::meaning_of_field(const cdb::region &r) {
+void hex_form::append_field(const cdb::region &r) {
     switch (r.what->kind) {
     case cdb::field_kind::number: {
-        cdb::meaning as = fact_row(r).as;
+        cdb::meaning as = meaning_of(r);
         std::uint32_t number = number_in(db.file(), start_of(r), *r.what);
+        meaning();
         if (as == cdb::meaning::OFFSET)
-            return place_text(db.file(), number);
-        return as_text(fact_of(as, number));
+            append_place(db.file(), number);
+        else
+            append(out.text, fact_of(as, number));
+        return;
     }
     case cdb::field_kind::reference:
-        return meaning_of_reference(r);
+        return append_reference(r);
     case cdb::field_kind::value:
-        return meaning_of_value(r, value_type(r));
+        return append_value(r, value_type(r));
     case cdb::field_kind::reserved:
     case cdb::field_kind::entries:
         break;
     }
-    return "";
 }
 
-std::string hex_form::meaning_in(const cdb::region &r) {
+void hex_form::append_meaning(const cdb::region &r) {
     if (r.what != nullptr)
-        return meaning_of_field(r);
-    if (r.record == "vx_value_t")
-        return meaning_of_value(r, array_type);
-    if (r.record == "text")
-        return text::quoted(db.file().part(r.offset, r.size).text(std::size_t{0}));
-    if (r.record == "handle")
-        return as_text(handle_at(db.file(), r.offset));
-    if (r.record == "length" || r.record == "var_id_t")
-        return std::to_string(db.file().number<std::uint32_t>(r.offset));
-    return "";
+        append_field(r);
+    else if (r.record == "vx_value_t")
+        append_value(r, array_type);
+    else if (r.record == "text")
+        text::append_quoted(meaning(), db.file().part(r.offset, r.size).text(std::size_t{0}));
+    else if (r.record == "handle")
+        append(meaning(), handle_at(db.file(), r.offset));
+    else if (r.record == "length" || r.record == "var_id_t")
+        append_number(meaning(), db.file().number<std::uint32_t>(r.offset));
 }
 
 /* "section 2, rsrc_pattr_t 5, ra_props", as cdef verify calls it. Only records are counted. */
-std::string name_of(const cdb::region &r) {
-    std::string name;
-    if (r.section)
-        name += "section " + std::to_string(*r.section) + ", ";
-    name += r.record;
+void hex_form::append_name(const cdb::region &r) {
+    if (r.section) {
+        append_number(out.text += "section ", *r.section);
+        out.text += ", ";
+    }
+    out.text += r.record;
     if (r.what != nullptr || r.record == "vx_value_t" || r.record == "var_id_t")
-        name += " " + std::to_string(r.index);
+        append_number(out.text += ' ', r.index);
     if (r.what != nullptr)
-        name += ", " + std::string(r.what->name);
-    return name;
+        out.text.append(", ").append(r.what->name);
+}
+
+void hex_form::show_line(const cdb::region &r, std::size_t at) {
+    append_offset(out.text, r.offset + at);
+    out.text += ' ';
+    std::size_t start = out.text.size();
+    for (std::byte b : db.file().part(r.offset + at, std::min(BYTES_A_LINE, r.size - at)).raw())
+        text::append_hex(out.text += ' ', std::span(&b, 1));
+    if (at == 0) {
+        out.text.resize(start + BYTES_A_LINE * 3, ' ');
+        out.text += "  ";
+        append_name(r);
+        append_meaning(r);
+    }
+    out.text += '\n';
+    out.flush_if_full();
 }
 
 void hex_form::show(const cdb::region &r) {
-    if (starts(r, "valid_values_t"))
-        list_type = type_at(lists, r.offset);
-    if (starts(r, "vx_array_t"))
-        array_type = type_at(arrays, r.offset);
-    std::string meaning = meaning_in(r);
-    for (std::size_t at = 0; at < r.size; at += BYTES_A_LINE) {
-        text::appendf(out.text, "%08zx ", r.offset + at);
-        std::size_t start = out.text.size();
-        auto line = db.file().part(r.offset + at, std::min(BYTES_A_LINE, r.size - at)).raw();
-        for (std::size_t i = 0; i < line.size(); ++i)
-            out.text += " " + text::hex_of(line.subspan(i, 1));
-        if (at == 0) {
-            out.text.resize(start + BYTES_A_LINE * 3, ' ');
-            out.text += "  " + name_of(r) + (meaning.empty() ? "" : ": ") + meaning;
-        }
-        out.text += '\n';
-        out.flush_if_full();
-    }
+    bool begins_record = r.what != nullptr && r.what->offset == 0;
+    if (begins_record && &format(r) == &cdb::format_for<valid_values_t>)
+        list_type = lists.at(r.offset);
+    if (begins_record && &format(r) == &cdb::format_for<vx_array_t>)
+        array_type = arrays.at(r.offset);
+    for (std::size_t at = 0; at < r.size; at += BYTES_A_LINE)
+        show_line(r, at);
 }
 
+/* Of a damaged file a type may be asked for before its list has been shown. */
 void hex_form::show() {
-    std::vector<cdb::region> regions = cdb::regions(db);
-    for (const cdb::region &r : regions)
-        note_types(r);
-    for (const cdb::region &r : regions)
-        show(r);
+    cdb::regions(db, [this](const cdb::region &r) { note_types(r); });
+    lists.sort();
+    arrays.sort();
+    cdb::regions(db, [this](const cdb::region &r) { show(r); });
     out.flush();
 }
 

@@ -1,0 +1,85 @@
+/* region_map.h: what each stretch of a file is, collected in any order and handed over in the order of the file. */
+#ifndef CDGEN_READER_REGION_MAP_H
+#define CDGEN_READER_REGION_MAP_H
+
+#include "cdb_view.h"
+
+#include "format/records.h"
+
+#include <deque>
+
+namespace cdb {
+
+/* What a stretch is: a record, by its position in record_formats, or one of those after them. */
+namespace stretch_kind {
+inline constexpr std::uint8_t TEXT = std::size(record_formats);
+inline constexpr std::uint8_t LENGTH = TEXT + 1;
+inline constexpr std::uint8_t BINARY = TEXT + 2;
+inline constexpr std::uint8_t HANDLE = TEXT + 3;
+inline constexpr std::uint8_t VALUE = TEXT + 4;
+inline constexpr std::uint8_t VARIABLE_ID = TEXT + 5;
+inline constexpr std::uint8_t FILLING = TEXT + 6;
+inline constexpr std::uint8_t COUNT = TEXT + 7;
+} // namespace stretch_kind
+
+constexpr std::uint8_t kind_of_record(const record_format &format) {
+    std::uint8_t kind = 0;
+    while (record_formats[kind] != &format)
+        ++kind;
+    return kind;
+}
+
+/* The regions of one part of a file: of its header and anchors, or of a section. A record takes 20 bytes however many
+ * fields it has, and so do values or records that follow each other: there may be as many as the file has words. */
+class region_map {
+public:
+    using taker = std::function<void(const region &)>;
+
+    /* file_size: in bytes. */
+    region_map(std::size_t file_size, const taker &to) : size(file_size), take(to) {}
+
+    /* Begins a part, whose regions are no longer than 4 GB away from its start. section: position among the anchors;
+     * nothing if each anchor is its own. */
+    void begin_part(std::optional<std::size_t> part_section, std::size_t part_start) {
+        section = part_section;
+        start = part_start;
+    }
+
+    /* offset: in the file. index: of the record in its table, or of the entry in its list. */
+    void add(std::uint8_t kind, std::size_t offset, std::size_t length, std::size_t index);
+
+    /* Hands over the regions of the part, and what lies unreached before them. Where two overlap, the one that starts
+     * first counts; of two that start together the longer one; of two that are as long, the one that was added first.
+     */
+    void finish_part();
+    /* Hands over what lies unreached after the last region. */
+    void finish();
+
+private:
+    struct stretch {
+        std::uint32_t offset; /* from the start of the part */
+        std::uint32_t length; /* bytes, of all that follow each other */
+        std::uint32_t index;  /* of the first */
+        std::uint32_t order;  /* of adding */
+        std::uint8_t kind;
+    };
+
+    /* The next region of a stretch whose regions are being handed over. */
+    class cursor;
+
+    bool stands_alone(std::deque<stretch>::const_iterator one) const;
+    void hand_over_all(const stretch &of);
+    void hand_over(const region &r);
+    void hand_over_unreached(std::size_t to);
+
+    std::size_t size;
+    const taker &take;
+    std::optional<std::size_t> section;
+    std::size_t start = 0;
+    std::size_t end = 0; /* of the regions that were handed over */
+    std::deque<stretch> stretches;
+};
+
+} // namespace cdb
+
+#endif

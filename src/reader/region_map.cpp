@@ -64,7 +64,7 @@ private:
             settle();
     }
 
-    /* A list's entries are no region of it. */
+    /* Skips a list's entries, which are regions of their own. */
     void settle() {
         now.section = kind == ANCHOR ? std::optional(now.index) : section;
         if (!is_record(kind)) {
@@ -126,7 +126,7 @@ void region_map::hand_over(const region &r) {
     end = r.offset + r.size;
 }
 
-bool region_map::stands_alone(std::deque<stretch>::const_iterator one) const {
+bool region_map::stands_alone(const std::deque<stretch>::const_iterator &one) const {
     auto next = one + 1;
     return next == stretches.end() || next->offset >= std::size_t{one->offset} + one->length;
 }

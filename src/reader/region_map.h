@@ -67,7 +67,7 @@ private:
     /* The next region of a stretch whose regions are being handed over. */
     class cursor;
 
-    bool stands_alone(std::deque<stretch>::const_iterator one) const;
+    bool stands_alone(const std::deque<stretch>::const_iterator &one) const;
     void hand_over_all(const stretch &of);
     void hand_over(const region &r);
     void hand_over_unreached(std::size_t to);

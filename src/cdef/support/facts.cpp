@@ -4,7 +4,7 @@
 
 #include "format/names.h"
 #include "format/sections.h"
-#include "report/json_text.h"
+#include "report/json_writer.h"
 #include "text/append.h"
 #include "text/hex.h"
 #include "text/number.h"

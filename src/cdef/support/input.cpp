@@ -13,6 +13,7 @@
 #include <string_view>
 #include <sys/stat.h>
 #include <unistd.h>
+#include <utility>
 
 namespace cdef {
 
@@ -102,7 +103,10 @@ bool is_database(const std::string &path) {
     return file.fd >= 0 && has_format_word(beginning_of(file.fd));
 }
 
-input::input(const std::string &path) : name(path), contents(contents_of(path)), db(contents) {}
+input::input(const std::string &path) : input(path, contents_of(path)) {}
+
+input::input(std::string file, std::vector<std::byte> read)
+    : name(std::move(file)), contents(std::move(read)), db(contents) {}
 
 std::optional<cdb::finding> readability::first_of(std::string_view code) const {
     auto found =

@@ -16,6 +16,8 @@ namespace cdef {
 struct input {
     /* Throws failure when it cannot be read. */
     explicit input(const std::string &path);
+    /* A database that has been read. file: its name, for messages. */
+    input(std::string file, std::vector<std::byte> read);
     input(const input &) = delete;
     input &operator=(const input &) = delete;
 

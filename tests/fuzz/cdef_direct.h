@@ -1,0 +1,27 @@
+/* cdef_direct.h: what the subcommands of cdef consist of, called without a command line and without files, which take
+ * most of the time that a small input takes. Each function fails if what comes does not go together. */
+#ifndef CDGEN_FUZZ_CDEF_DIRECT_H
+#define CDGEN_FUZZ_CDEF_DIRECT_H
+
+#include <cstddef>
+#include <string>
+#include <vector>
+
+namespace fuzz {
+
+using bytes = std::vector<std::byte>;
+using words = std::vector<std::string>;
+
+/* Verifies a database, and shows it or writes its source, as the subcommand and its options say, if it can be read. */
+void read_directly(const bytes &image, const words &form);
+
+/* Compares two databases, if both can be read. */
+void compare_directly(const bytes &before, const bytes &after);
+
+/* Checks a source, and compiles it with the database in memory: the first error is the compiler's. output: the name
+ * that the database would have. */
+void check_directly(const bytes &source, const std::string &output, const words &form);
+
+} // namespace fuzz
+
+#endif

@@ -231,7 +231,7 @@ bool repair::try_words_near(const finding &f) {
     class_tables tables = tables_of(db, *f.section);
     for (const bytes &table : {tables.strings, tables.valid_vals, tables.variety_lists, tables.sd_defs})
         if (table.holds(*place, 2 * WORD)) {
-            auto at = static_cast<std::size_t>(table.raw().data() - db.file().raw().data()) + *place;
+            auto at = static_cast<std::size_t>(table.raw().data() - db.file().raw().data() + *place);
             if (try_sum(at) || try_sum(at + WORD))
                 return true;
         }

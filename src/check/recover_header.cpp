@@ -57,6 +57,8 @@ void recovery::take_header(const attr_text &text, bool guessed) {
         try {
             compiler.take_line(text);
             warned.after_step(see, kind);
+            if (kind == SC_CONTROL_DEFINITION && compiler.output() == nullptr)
+                compiler.drop_latest_class(); /* there may be millions */
             open_stanza(kind, guessed || header_reported);
             known.stanza().misplaced = known.split.kind != NO_KIND;
             index_lost = index_lost || no_index;

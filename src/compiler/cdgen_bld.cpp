@@ -58,6 +58,12 @@ vx_uint64_t class_size(rsrc_class_t &rc) {
     return size + strings_size(rc.u_rc_strings);
 }
 
+bool names_variable_class(const cdb_ref_t &dattrs) {
+    std::span<rsrc_dattr_t> all = records_of<rsrc_dattr_t>(staged_content(dattrs));
+    return std::any_of(all.begin(), all.end(),
+                       [](const rsrc_dattr_t &attr) { return attr.u_ra_vclass.offset[0] != CDB_NONE; });
+}
+
 template <class Record> Record load(const char *from) {
     Record record;
     memcpy(&record, from, sizeof record);
@@ -241,8 +247,9 @@ void write_header(cdgen &cx) {
 } // namespace
 
 size_t cdb_size(cdgen &cx) {
-    vx_uint64_t size =
-        sizeof(orb_cdb_header_t) + sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.image.dsect_count);
+    vx_uint64_t size = sizeof(orb_cdb_header_t) +
+                       sizeof(cdb_dsect_anchor_t) * static_cast<size_t>(cx.image.dsect_count) +
+                       cx.sections.dropped_class_sizes;
     for (const auto &vc : records_of<rsrc_variable_class_t>(&cx.sections.rsrc_var_class_tbl))
         size += sizeof vc + strings_size(vc.u_rvc_string_tbl) + round8(sizeof(var_id_t) * vc.rvc_var_count);
     for (const auto &map : records_of<rsrc_cmmap_t>(&cx.sections.rsrc_cmmap_tbl))
@@ -252,6 +259,22 @@ size_t cdb_size(cdgen &cx) {
     for (const auto &mgr : records_of<rsrc_mgr_t>(&cx.sections.rsrc_mgr_tbl))
         size += sizeof mgr + strings_size(mgr.u_rm_strings_table);
     return checked_size(size);
+}
+
+void drop_latest_class(cdgen &cx) {
+    tbl &classes = cx.sections.rsrc_class_tbl;
+    std::span<rsrc_class_t> all = records_of<rsrc_class_t>(&classes);
+    if (all.empty() || names_variable_class(all.back().u_rc_dattrsC) || names_variable_class(all.back().u_rc_dattrs))
+        return;
+    try {
+        cx.sections.dropped_class_sizes += class_size(all.back());
+    } catch (const fatal_exit &) { /* a table is too large, which is an error at the end of the source */
+        return;
+    }
+    for (auto table = cdb::side_tables_as_made.rbegin(); table != cdb::side_tables_as_made.rend(); ++table)
+        drop_filed(cx, all.back().*table->ref);
+    classes.tbl_next -= sizeof(rsrc_class_t);
+    memset(classes.tbl_next, 0, sizeof(rsrc_class_t));
 }
 
 void add_rsrc_class_tbls(cdgen &cx) {

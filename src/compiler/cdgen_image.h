@@ -44,6 +44,9 @@ void bld_cdb(cdgen &cx);
 std::vector<std::byte> image_in_memory(cdgen &cx);
 size_t fit_image(cdgen &cx);
 size_t cdb_size(cdgen &cx);
+/* Gives back the class that was completed last, and keeps the size of its section: for a compilation without an image.
+ * A class that is needed at the end of the source stays. */
+void drop_latest_class(cdgen &cx);
 void add_rsrc_class_tbls(cdgen &cx);
 void add_rsrc_mgr_tbls(cdgen &cx);
 void add_rsrc_cmmap_tbls(cdgen &cx);

@@ -30,6 +30,8 @@ struct section_tables {
     tbl rsrc_mgr_tbl{8 * sizeof(rsrc_mgr_t), "ResourceManagers"};
     tbl rsrc_cmmap_tbl{8 * sizeof(rsrc_cmmap_t), "ResourceCMMaps"};
     tbl rsrc_var_class_tbl{8 * sizeof(rsrc_variable_class_t), "ResourceVariableClasses"};
+    vx_uint64_t dropped_class_sizes =
+        0; /* of the sections of classes that are counted, but not in their table any more */
     int rsrc_class_count = 0;
     int rsrc_mgr_count = 0;
     int rsrc_cmmap_count = 0;

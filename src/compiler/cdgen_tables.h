@@ -86,6 +86,8 @@ void trim_tbl(tbl *t);
 /* Moves a finished table's bytes to compact storage and points the record at them, or at nothing if there are none.
  * With many classes, the unused rest would be most of the memory. The table itself is reused. */
 void file_tbl(cdgen &cx, cdb_ref_t &ref);
+/* Gives back a filed table's bytes. Of several tables, the latest one comes first. */
+void drop_filed(cdgen &cx, const cdb_ref_t &ref);
 
 /* Appends len bytes, zero-filled up to a multiple of 8; returns their offset from tbl_base. add_to_tbl is the name that
  * serves for strings and serialised values. */
@@ -135,6 +137,8 @@ public:
 
     /* n zeroed bytes, aligned for any value, that stay until the pool is emptied. Null if there is no memory. */
     char *take(size_t n);
+    /* Gives back what was taken at this address and after it, if that is in the latest chunk. */
+    void give_back_from(const char *taken);
     /* Frees everything except the latest chunk, which is reused. */
     void clear();
 

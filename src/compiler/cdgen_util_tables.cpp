@@ -242,6 +242,12 @@ char *text_pool::take(size_t n) {
     return taken;
 }
 
+void text_pool::give_back_from(const char *taken) {
+    auto distance = reinterpret_cast<uintptr_t>(taken) - reinterpret_cast<uintptr_t>(head->bytes());
+    if (distance < head->size)
+        left = head->size - distance;
+}
+
 void text_pool::clear() {
     if (head == nullptr)
         return;
@@ -279,4 +285,15 @@ void file_tbl(cdgen &cx, cdb_ref_t &ref) {
     else
         stage_tbl(ref, open->used() <= SMALL ? keep_copy(cx, *open) : keep_block(cx, *open));
     cx.store.spare_tables.push_back(open);
+}
+
+void drop_filed(cdgen &cx, const cdb_ref_t &ref) {
+    tbl_content *kept = staged_content(ref);
+    if (kept == nullptr)
+        return;
+    if (kept->tbl_owner == memory_owner::POOL)
+        return cx.store.filed_small.give_back_from(reinterpret_cast<const char *>(kept));
+    kept->release();
+    if (kept == &cx.store.filed.back())
+        cx.store.filed.pop_back();
 }

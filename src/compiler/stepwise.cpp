@@ -77,6 +77,10 @@ void stepwise_compiler::size_image() {
     fit_image(cx);
 }
 
+void stepwise_compiler::drop_latest_class() {
+    ::drop_latest_class(cx);
+}
+
 std::vector<std::byte> stepwise_compiler::image() {
     return image_in_memory(cx);
 }

@@ -29,6 +29,8 @@ public:
     static size_t closing_steps();
     void take_closing_step(size_t step);
     void size_image();
+    /* Gives back what only an image needs of the class that was completed last. */
+    void drop_latest_class();
     /* The database, in the machine's own byte order; after all closing steps. */
     std::vector<std::byte> image();
     /* That image in the other byte order. */

@@ -26,19 +26,23 @@ SOURCES = {
     "maps": ("", "ClassToManagerMapping\n"),
 }
 
+# Each of these stanzas is allowed; the source as a whole lacks a map.
+CLASSES = {
+    "classes": ("", "ControlDefinition\n"),
+    "classes-with-attributes": ("", "ControlDefinition\nPersistentResourceAttribute\n"),
+    "classes-with-dynamic-attributes": ("", "ControlDefinition\nDynamicResourceAttribute\n"),
+}
+
 
 FORMS = ("text", "json", "sarif", "github", "gitlab")
 CASES = [("different-headers", form) for form in FORMS] + [("unknown-attributes", form) for form in FORMS[1:3]]
 CASES += [(name, "text") for name in SOURCES if name != "different-headers"]
 
 
-@pytest.mark.slow(30)
-@pytest.mark.parametrize(("name", "form"), CASES)
-def test_bound(directory, name, form):
-    """Every finding is written, or counted."""
+def check(directory, head, line, form="text"):
+    """Check a source of such lines in the memory that is allowed; what is said on standard error."""
     if PROGRAMS.sanitizers or not PROGRAMS.is_on("CDGEN_STATIC"):
         pytest.skip("a sanitizer or a shared library takes address space of its own")
-    head, line = SOURCES[name]
     source = directory / "wrong"
     with source.open("w") as file:
         file.write(head)
@@ -50,6 +54,23 @@ def test_bound(directory, name, form):
                                 preexec_fn=lambda: resource.setrlimit(resource.RLIMIT_AS, (bound, bound)))
     messages = (directory / "err").read_bytes()
     same((result.returncode, b"memory" in messages), (1, False), f"status, in {bound} bytes")
+    return messages
+
+
+@pytest.mark.slow(30)
+@pytest.mark.parametrize(("name", "form"), CASES)
+def test_bound(directory, name, form):
+    """Every finding is written, or counted."""
+    messages = check(directory, *SOURCES[name], form)
     if form == "text":
         same(messages.count(b": error: "), 100, "errors shown")
         assert int(messages.splitlines()[-1].split()[0]) >= LINES
+
+
+@pytest.mark.slow(30)
+@pytest.mark.parametrize("name", CLASSES)
+def test_classes(directory, name):
+    """Of a class that has no error, nothing is kept that only its database would need."""
+    messages = check(directory, *CLASSES[name])
+    same(messages.count(b": error: No class-to-manager maps defined"), 1, "errors shown")
+    assert int(messages.splitlines()[-1].split()[3]) >= LINES, "warnings counted"

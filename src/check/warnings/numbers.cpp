@@ -49,7 +49,7 @@ public:
     struct entry {
         std::string name; /* of the attribute */
         mention id;
-        long value = 0;
+        vx_int64_t value = 0;
     };
 
     void begin_class() {
@@ -59,7 +59,7 @@ public:
         current.name = text;
     }
     void take_id(const view &see) {
-        constexpr long HIGHEST = 0xFFFE; /* the next one means that there is no locator */
+        constexpr vx_int64_t HIGHEST = 0xFFFE; /* the next one means that there is no locator */
         current.value = check::number(see.value(), 0).value;
         if (current.value > HIGHEST)
             current.id = see.value_mention();

@@ -271,8 +271,8 @@ void drop_latest_class(cdgen &cx) {
     } catch (const fatal_exit &) { /* a table is too large, which is an error at the end of the source */
         return;
     }
-    for (auto table = cdb::side_tables_as_made.rbegin(); table != cdb::side_tables_as_made.rend(); ++table)
-        drop_filed(cx, all.back().*table->ref);
+    for (size_t table = cdb::side_tables_as_made.size(); table-- > 0;)
+        drop_filed(cx, all.back().*cdb::side_tables_as_made[table].ref);
     classes.tbl_next -= sizeof(rsrc_class_t);
     memset(classes.tbl_next, 0, sizeof(rsrc_class_t));
 }

@@ -89,6 +89,20 @@ auto key_of(const finding &f) {
     return std::tuple(f.broken, f.offset, f.section, f.record, f.index);
 }
 
+using finding_key = decltype(key_of(std::declval<finding>()));
+
+/* Those of the findings that the corrected database has too. */
+std::set<finding_key> remaining(const database &corrected, std::span<const finding> found) {
+    std::set<finding_key> before, stay;
+    for (const finding &f : found)
+        before.insert(key_of(f));
+    verify(corrected, [&](finding &&f) {
+        if (before.contains(key_of(f)))
+            stay.insert(key_of(f));
+    });
+    return stay;
+}
+
 /* The warnings that the corrected database has too are nothing of it. */
 std::vector<diagnosed> caused_by_one(const database &db, std::vector<finding> &&found, const repair &repaired) {
     region at = corrected_region(repaired);
@@ -97,8 +111,7 @@ std::vector<diagnosed> caused_by_one(const database &db, std::vector<finding> &&
     if (cause == found.end())
         cause = found.insert(found.begin(), contradicted(db, repaired, at));
     auto first = static_cast<std::size_t>(cause - found.begin());
-    std::set<decltype(key_of(found.front()))> stay;
-    verify(repaired.corrected(), [&](finding &&f) { stay.insert(key_of(f)); });
+    std::set<finding_key> stay = remaining(repaired.corrected(), found);
     std::vector<std::size_t> causes(found.size(), first);
     for (std::size_t i = 0; i < found.size(); ++i)
         if (stay.contains(key_of(found[i])))
@@ -170,13 +183,27 @@ std::vector<diagnosed> caused_by_rule(std::vector<finding> &&found) {
 } // namespace
 
 std::vector<diagnosed> diagnose(const database &db) {
-    std::vector<finding> found = verify(db);
+    return diagnose(db, verify(db));
+}
+
+std::vector<diagnosed> diagnose(const database &db, std::vector<finding> &&found) {
     if (found.size() < 2 || is_sound(found))
         return caused_by_rule(std::move(found));
     repair repaired(db, found);
     if (repaired.succeeds())
         return caused_by_one(db, std::move(found), repaired);
     return caused_by_rule(std::move(found));
+}
+
+first_findings find_first(const database &db, std::size_t most_kept) {
+    first_findings all;
+    verify(db, [&](finding &&f) {
+        ++all.count;
+        all.sound = all.sound && !is_error(f);
+        if (all.kept.size() < most_kept)
+            all.kept.push_back(std::move(f));
+    });
+    return all;
 }
 
 const rule &contradicting_rule() {

@@ -30,6 +30,19 @@ struct diagnosed {
  * Takes the time of verify(), and if there are several errors that of some hundred more, but for at most 64 MB. */
 std::vector<diagnosed> diagnose(const database &db);
 
+/* The same of what verify() has found. */
+std::vector<diagnosed> diagnose(const database &db, std::vector<finding> &&found);
+
+/* Findings of a database that may have millions: the first ones, and how many there are. */
+struct first_findings {
+    std::vector<finding> kept;
+    std::size_t count = 0;
+    bool sound = true; /* none of them all is an error */
+};
+
+/* Takes the time of verify(). */
+first_findings find_first(const database &db, std::size_t most_kept);
+
 } // namespace cdb
 
 #endif

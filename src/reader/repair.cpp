@@ -7,6 +7,7 @@
 #include "reader/tables.h"
 
 #include <charconv>
+#include <limits>
 
 namespace cdb {
 
@@ -37,18 +38,19 @@ std::optional<std::int64_t> excess_of(const finding &f) {
     return static_cast<std::int64_t>(*found - *expected);
 }
 
-/* Ends at the first error. */
-bool has_errors(const database &db) {
-    struct error_found {};
+/* Whether there are no errors, and no more than so many warnings. Ends at the finding that is too much. */
+bool has_only_warnings(const database &db, std::size_t most) {
+    struct too_much {};
+    std::size_t warnings = 0;
     try {
-        verify(db, [](finding &&f) {
-            if (f.broken->level == severity::error)
-                throw error_found();
+        verify(db, [&](finding &&f) {
+            if (f.broken->level == severity::error || ++warnings > most)
+                throw too_much();
         });
-    } catch (const error_found &) {
-        return true;
+    } catch (const too_much &) {
+        return false;
     }
-    return false;
+    return true;
 }
 
 std::size_t anchor_at(std::size_t index) {
@@ -104,9 +106,8 @@ std::size_t repair::offset() const {
  * one removes a warning as well. */
 bool repair::is_better() const {
     if (!only_sum_is_wrong)
-        return !has_errors(corrected());
-    std::vector<finding> left = verify(corrected());
-    return is_sound(left) && left.size() + 2 <= findings.size();
+        return has_only_warnings(corrected(), std::numeric_limits<std::size_t>::max());
+    return findings.size() >= 2 && has_only_warnings(corrected(), findings.size() - 2);
 }
 
 /* A checksum that was right stays right. */
@@ -231,7 +232,8 @@ bool repair::try_words_near(const finding &f) {
     class_tables tables = tables_of(db, *f.section);
     for (const bytes &table : {tables.strings, tables.valid_vals, tables.variety_lists, tables.sd_defs})
         if (table.holds(*place, 2 * WORD)) {
-            auto at = static_cast<std::size_t>(table.raw().data() - db.file().raw().data() + *place);
+            auto at = static_cast<std::size_t>(table.raw().data() - db.file().raw().data());
+            at += static_cast<std::size_t>(*place);
             if (try_sum(at) || try_sum(at + WORD))
                 return true;
         }

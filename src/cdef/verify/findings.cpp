@@ -67,6 +67,11 @@ std::string note_of(const std::string &file, std::size_t consequences) {
     return note + std::to_string(consequences) + " findings follow from this one; --all shows them\n";
 }
 
+std::string note_of_many(const std::string &file, std::size_t count) {
+    return text::escaped(file) + ": note: " + std::to_string(count) +
+           " findings, too many to say which follow from which others\n";
+}
+
 void add_finding(report::json_writer &to, const cdb::diagnosed &each, std::size_t at) {
     const cdb::finding &f = each.found;
     to.open_object();

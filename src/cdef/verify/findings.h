@@ -25,6 +25,9 @@ std::vector<cdb::diagnosed> errors_of(std::vector<cdb::diagnosed> &&all);
 /* One line that says how many findings follow from the one before it, with a newline. */
 std::string note_of(const std::string &file, std::size_t consequences);
 
+/* One line that says why nothing is said of what follows from what, with a newline. */
+std::string note_of_many(const std::string &file, std::size_t count);
+
 /* Adds a finding to a list. at: its position there. */
 void add_finding(report::json_writer &to, const cdb::diagnosed &each, std::size_t at);
 

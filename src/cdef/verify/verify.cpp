@@ -34,7 +34,12 @@ public:
     verify_form &operator=(const verify_form &) = delete;
     virtual ~verify_form() = default;
 
-    virtual void add_file(const std::string &name, const std::vector<cdb::diagnosed> &findings, bool sound) = 0;
+    virtual void begin_file(const std::string &name, bool sound) = 0;
+    virtual void add(const std::vector<cdb::diagnosed> &findings) = 0;
+    /* Instead, if there are so many that nobody looks for their causes: says so, and each is added by itself. */
+    virtual void begin_many(std::size_t count) = 0;
+    virtual void add_one(const cdb::finding &found) = 0;
+    virtual void end_file() = 0;
     virtual void add_unreadable(const std::string &name, const std::string &why) = 0;
     virtual void close() = 0;
 };
@@ -44,19 +49,30 @@ class text_form : public verify_form {
 public:
     explicit text_form(bool with_consequences) : shows_all(with_consequences) {}
 
-    void add_file(const std::string &name, const std::vector<cdb::diagnosed> &findings, bool /* sound */) override {
+    void begin_file(const std::string &name, bool /* sound */) override {
+        file = name;
+    }
+    void add(const std::vector<cdb::diagnosed> &findings) override {
         std::size_t hidden = 0;
         for (std::size_t i = 0; i < findings.size(); ++i) {
             bool follows = findings[i].cause != i;
             hidden += follows && !shows_all;
             if (!follows || shows_all)
-                out.text += (follows ? "  " : "") + verify::line_of(name, findings[i].found);
+                out.text += (follows ? "  " : "") + verify::line_of(file, findings[i].found);
             bool group_ends = i + 1 == findings.size() || findings[i + 1].cause == i + 1;
             if (group_ends && hidden > 0)
-                out.text += verify::note_of(name, std::exchange(hidden, 0));
+                out.text += verify::note_of(file, std::exchange(hidden, 0));
             out.flush_if_full();
         }
     }
+    void begin_many(std::size_t count) override {
+        out.text += verify::note_of_many(file, count);
+    }
+    void add_one(const cdb::finding &found) override {
+        out.text += verify::line_of(file, found);
+        out.flush_if_full();
+    }
+    void end_file() override {}
     void add_unreadable(const std::string & /* name */, const std::string & /* why */) override {}
     void close() override {
         out.flush();
@@ -64,6 +80,7 @@ public:
 
 private:
     bool shows_all;
+    std::string file;
     output out;
 };
 
@@ -74,13 +91,24 @@ public:
         to.add_schema("cdef-verify.schema.json", 1);
         to.open_list("files");
     }
-    void add_file(const std::string &name, const std::vector<cdb::diagnosed> &findings, bool sound) override {
+    void begin_file(const std::string &name, bool sound) override {
         to.open_object();
         to.add_text("file", name);
         to.add_truth("sound", sound);
+    }
+    void add(const std::vector<cdb::diagnosed> &findings) override {
         to.open_list("findings");
         for (std::size_t i = 0; i < findings.size(); ++i)
             verify::add_finding(to, findings[i], i);
+    }
+    void begin_many(std::size_t /* count */) override {
+        to.add_truth("diagnosed", false);
+        to.open_list("findings");
+    }
+    void add_one(const cdb::finding &found) override {
+        verify::add_finding(to, {found, 0}, 0);
+    }
+    void end_file() override {
         to.close();
         to.close();
     }
@@ -105,18 +133,41 @@ std::unique_ptr<verify_form> form_of(const verify_options &options) {
     return std::make_unique<text_form>(options.shows_all);
 }
 
+constexpr std::size_t MOST_DIAGNOSED = 10000; /* findings of which the causes are looked for */
+
+bool is_shown(const cdb::finding &found, const verify_options &options) {
+    return !options.quiet || found.broken->level == cdb::severity::error;
+}
+
+void show_diagnosis(const cdb::database &db, std::vector<cdb::finding> &&found, const verify_options &options,
+                    verify_form &form) {
+    std::vector<cdb::diagnosed> findings = cdb::diagnose(db, std::move(found));
+    form.add(options.quiet ? verify::errors_of(std::move(findings)) : findings);
+}
+
+/* Verifies again, so that the findings are never in memory together. */
+void show_many(const cdb::database &db, std::size_t count, const verify_options &options, verify_form &form) {
+    form.begin_many(count);
+    cdb::verify(db, [&](cdb::finding &&found) {
+        if (is_shown(found, options))
+            form.add_one(found);
+    });
+}
+
 /* Shows the findings in one file; whether it passes. */
 bool judge(const std::string &path, const verify_options &options, verify_form &form) {
     input in(path);
     if (is_text(in.contents))
         throw failure(path + ": a text, not a database; 'cdef check' checks sources");
-    std::vector<cdb::diagnosed> findings = cdb::diagnose(in.db);
-    auto is_warning = [](const cdb::diagnosed &each) { return each.found.broken->level == cdb::severity::warning; };
-    bool sound = options.warnings_count ? findings.empty() : std::all_of(findings.begin(), findings.end(), is_warning);
-    if (options.quiet)
-        findings = verify::errors_of(std::move(findings));
-    form.add_file(path, findings, sound);
-    return sound;
+    cdb::first_findings first = cdb::find_first(in.db, MOST_DIAGNOSED);
+    bool pass = options.warnings_count ? first.count == 0 : first.sound;
+    form.begin_file(path, pass);
+    if (first.count > first.kept.size())
+        show_many(in.db, first.count, options, form);
+    else
+        show_diagnosis(in.db, std::move(first.kept), options, form);
+    form.end_file();
+    return pass;
 }
 
 int run(const verify_options &options) {

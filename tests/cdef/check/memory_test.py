@@ -5,16 +5,14 @@ the address space, so that nothing depends on what else the machine does.
 """
 
 import os
-import resource
-import subprocess
 
 import pytest
 
+from bounded import run_bounded
 from compare import same
 from programs import PROGRAMS
 
 LINES = int(os.environ.get("WRONG_LINES", "300000"))
-MEGABYTES = 1 << 20
 
 SOURCES = {
     "unknown-headers": ("", "x\n"),
@@ -41,19 +39,12 @@ CASES += [(name, "text") for name in SOURCES if name != "different-headers"]
 
 def check(directory, head, line, form="text"):
     """Check a source of such lines in the memory that is allowed; what is said on standard error."""
-    if PROGRAMS.sanitizers or not PROGRAMS.is_on("CDGEN_STATIC"):
-        pytest.skip("a sanitizer or a shared library takes address space of its own")
     source = directory / "wrong"
     with source.open("w") as file:
         file.write(head)
         file.writelines(line.format(number) for number in range(LINES))
-    bound = 8 * source.stat().st_size + 16 * MEGABYTES
-    command = [PROGRAMS.cdef, "check", "--format", form, source]
-    with (directory / "out").open("wb") as out, (directory / "err").open("wb") as err:
-        result = subprocess.run(command, stdout=out, stderr=err, timeout=3600,
-                                preexec_fn=lambda: resource.setrlimit(resource.RLIMIT_AS, (bound, bound)))
-    messages = (directory / "err").read_bytes()
-    same((result.returncode, b"memory" in messages), (1, False), f"status, in {bound} bytes")
+    status, _, messages = run_bounded(directory, [PROGRAMS.cdef, "check", "--format", form], source)
+    same(status, 1, "status")
     return messages
 
 

@@ -149,3 +149,21 @@ TEST(diagnosis, one_damaged_byte_is_one_cause) {
     EXPECT_GE(one_cause, SAMPLE * 99 / 100);
     EXPECT_GE(at_the_damage, SAMPLE * 95 / 100);
 }
+
+TEST(find_first, counts_what_it_does_not_keep) {
+    std::vector<std::byte> image = small();
+    image[CHECKSUM] ^= std::byte{1};
+    put_right(image, VARIETY_LIST, 0xFFFF);
+    std::vector<cdb::finding> all = cdb::verify(cdb::database(image));
+    ASSERT_GE(all.size(), 2U);
+    cdb::first_findings first = cdb::find_first(cdb::database(image), 1);
+    EXPECT_EQ(first.count, all.size());
+    ASSERT_EQ(first.kept.size(), 1U);
+    EXPECT_EQ(first.kept[0].offset, all[0].offset);
+    EXPECT_FALSE(first.sound);
+}
+
+TEST(find_first, is_sound_without_errors) {
+    std::vector<std::byte> image = small();
+    EXPECT_TRUE(cdb::find_first(cdb::database(image), 0).sound);
+}

@@ -1,0 +1,26 @@
+"""Run a program in the memory that its inputs allow it: 8 times their size and 16 MB.
+
+The limit is one of the address space, so that nothing depends on what else the machine does.
+"""
+
+import resource
+import subprocess
+
+import pytest
+
+from programs import PROGRAMS
+
+MEGABYTES = 1 << 20
+
+
+def run_bounded(directory, command, *inputs):
+    """Status, and what is said on both streams."""
+    if PROGRAMS.sanitizers or not PROGRAMS.is_on("CDGEN_STATIC"):
+        pytest.skip("a sanitizer or a shared library takes address space of its own")
+    bound = 8 * sum(path.stat().st_size for path in inputs) + 16 * MEGABYTES
+    with (directory / "out").open("wb") as out, (directory / "err").open("wb") as err:
+        result = subprocess.run([*command, *inputs], stdout=out, stderr=err, timeout=3600, check=False,
+                                preexec_fn=lambda: resource.setrlimit(resource.RLIMIT_AS, (bound, bound)))
+    errors = (directory / "err").read_bytes()
+    assert b"memory" not in errors, f"in {bound} bytes"
+    return result.returncode, directory / "out", errors

@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <span>
+#include <tuple>
 #include <utility>
 
 namespace language {
@@ -99,6 +100,16 @@ name_list property_names(int attr_type) {
     default:
         return names_of(act_props);
     }
+}
+
+bool comes_before(const table_attrs &one, const table_attrs &other) {
+    auto rank = [](const table_attrs &attr) {
+        bool required = (attr.req_bit & OPTIONAL) == 0;
+        bool is_name = std::string_view(attr.ta_name) == "Name";
+        return required ? std::tuple(0, attr.dup_allowed, attr.req_bit, static_cast<const table_attrs *>(nullptr))
+                        : std::tuple(1, is_name ? 0 : 1, vx_uint32_t{0}, &attr);
+    };
+    return rank(one) < rank(other);
 }
 
 name_list missing_names(const srtable_ctrl &kind, vx_uint32_t seen) {

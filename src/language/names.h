@@ -27,6 +27,11 @@ guess attribute_meant_by(std::string_view text, const srtable_ctrl &kind);
 /* The properties that an attribute type, such as AT_PATTR_PROPS, takes. */
 name_list property_names(int attr_type);
 
+/* Whether the one of two attributes of a kind usually comes first in a stanza. Required ones are in the order of their
+ * bits, except that those that may be repeated are last. Optional ones are in the catalogue's order, except that a name
+ * is first. */
+bool comes_before(const table_attrs &one, const table_attrs &other);
+
 /* The required attributes of a kind that are not in seen, a mask of their req_bits. */
 name_list missing_names(const srtable_ctrl &kind, vx_uint32_t seen);
 

@@ -5,10 +5,11 @@
 #include "cdef/source/error.h"
 #include "format/names.h"
 #include "language/fields.h"
+#include "language/names.h"
 #include "text/number.h"
 
+#include <algorithm>
 #include <array>
-#include <tuple>
 
 namespace cdef::source {
 
@@ -17,14 +18,6 @@ namespace {
 using enum cdb::meaning;
 
 constexpr std::string_view NO_PERMISSION = "-"; /* stands for no permission letter */
-
-/* Required lines are in the order of their bits, except that those that may be repeated are last. Optional ones are in
- * the catalogue's order, except that a name is first. */
-auto rank_of(const stanza_line &line) {
-    if (line.is_required())
-        return std::tuple(0, line.attribute->dup_allowed, line.attribute->req_bit);
-    return std::tuple(1, line.fact->is == cdb::role::NAME ? 0 : 1, vx_uint32_t{0});
-}
 
 bool is_text(const stanza_line &line) {
     return line.field->kind == cdb::field_kind::reference;
@@ -134,8 +127,9 @@ std::vector<stanza_line> lines_of(std::span<const table_attrs> attributes, const
                                   [offset](const cdb::field &f) { return f.offset == offset; });
         lines.push_back({&attribute, &*field, &format.fact_of(*field)});
     }
-    std::stable_sort(lines.begin(), lines.end(),
-                     [](const stanza_line &a, const stanza_line &b) { return rank_of(a) < rank_of(b); });
+    std::sort(lines.begin(), lines.end(), [](const stanza_line &a, const stanza_line &b) {
+        return language::comes_before(*a.attribute, *b.attribute);
+    });
     return lines;
 }
 

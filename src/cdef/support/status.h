@@ -20,13 +20,15 @@ struct meanings {
 };
 
 /* FAILED also stands for a wrong command line and for output that cannot be written. */
-inline constexpr std::array<meanings, 9> statuses = {{
+inline constexpr std::array<meanings, 10> statuses = {{
     {"verify", "no errors", "errors, or warnings with --werror", "a file cannot be read, or is a text"},
     {"dump", "the database is shown", "", "the database cannot be read, or is not sound (--hex shows it then too)"},
     {"diff", "no difference (with --compat: B can take the place of A)", "differences (with --compat: it cannot)",
      "a database cannot be read, is not sound, or is too entangled"},
     {"source", "the source is written", "", "the database cannot be read, or no source gives it back"},
     {"check", "no errors", "errors, or warnings with --werror", "a source cannot be read, or is a database"},
+    {"format", "done (with --check or --diff: nothing would change)", "with --check or --diff: a source would change",
+     "a source cannot be read or written, or has errors"},
     {"build", "all databases are made or up to date",
      "errors, or warnings with --werror; the databases of the other sources are made",
      "a file cannot be read or written; the other databases are made"},

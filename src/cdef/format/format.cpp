@@ -1,0 +1,106 @@
+/* format.cpp: cdef format: sources in their usual form. */
+
+#include "formatter/format.h"
+
+#include "cdef/cdef.h"
+#include "cdef/support/failure.h"
+#include "cdef/support/finding_options.h"
+#include "cdef/support/output.h"
+#include "cdef/support/replace.h"
+#include "cdef/support/shown_diff.h"
+#include "cdef/support/status.h"
+#include "report/report.h"
+#include "text/shown.h"
+
+#include <CLI/CLI.hpp>
+
+#include <algorithm>
+#include <cstdio>
+#include <memory>
+#include <string>
+#include <unistd.h>
+#include <vector>
+
+namespace cdef {
+
+namespace {
+
+struct format_options {
+    std::vector<std::string> sources;
+    bool in_place = false;
+    bool checks = false; /* only names what would change */
+    bool diffs = false;  /* only shows what would change */
+    bool reorder = false;
+};
+
+/* A text that is to be read by programs, too. */
+std::string name_line(const std::string &source) {
+    return (isatty(STDOUT_FILENO) == 0 ? source : text::masked(source)) + "\n";
+}
+
+/* Writes what is wanted of a formatted source; whether the source was as it should be. */
+bool write(const std::string &source, const std::string &before, const std::string &after,
+           const format_options &options) {
+    bool same = before == after;
+    if (options.checks)
+        print(same ? "" : name_line(source));
+    else if (options.diffs)
+        print(shown_diff(source, before, after));
+    else if (!options.in_place || source == "-")
+        print(after);
+    else if (!same)
+        replace_file(source, before, after);
+    return same || (!options.checks && !options.diffs);
+}
+
+/* Throws failure or check::cannot_check if the source is left alone. */
+bool format_source(const std::string &source, const format_options &options) {
+    require_source(source);
+    std::string before = text_of_file(source);
+    formatter::formatted result = formatter::format(before, source, {.reorder = options.reorder});
+    if (result.error)
+        std::fputs(report::as_text(source, *result.error).c_str(), stderr);
+    if (result.is_left_alone())
+        throw failure(source + ": not formatted, because " + result.refusal);
+    return write(source, before, result.text, options);
+}
+
+int format_all(const format_options &options) {
+    int status = OK;
+    for (const std::string &source : options.sources) {
+        try {
+            status = std::max(status, format_source(source, options) ? OK : FOUND);
+        } catch (const failure &reason) {
+            print_error(reason.what());
+            status = FAILED;
+        } catch (const check::cannot_check &unreadable) {
+            print_error(unreadable.what());
+            status = FAILED;
+        }
+    }
+    return status;
+}
+
+} // namespace
+
+void add_format(CLI::App &app, int &status) {
+    auto options = std::make_shared<format_options>();
+    CLI::App *command = app.add_subcommand("format", "Gives sources their usual form, and never another meaning");
+    command->add_option("SOURCE", options->sources, "Source to format; - is standard input")->required();
+    auto *in_place = command->add_flag("-i,--in-place", options->in_place,
+                                       "Replace the sources; without it, formatted sources go to standard output");
+    auto *checks = command->add_flag("--check", options->checks, "Only list the sources that would change");
+    auto *diffs = command->add_flag("--diff", options->diffs, "Only show what would change, as a diff");
+    in_place->excludes(checks)->excludes(diffs);
+    checks->excludes(diffs);
+    command->add_flag("--reorder", options->reorder, "Put attributes into their usual order, where it means nothing");
+    command->footer("Examples:\n"
+                    "  cdef format disk.cdefsrc | less     how it would look\n"
+                    "  cdef format -i *.cdefsrc            format these sources\n"
+                    "  cdef format --check *.cdefsrc       for a build: list those that are not formatted\n"
+                    "\n" +
+                    status_help("format"));
+    command->callback([options, &status] { status = format_all(*options); });
+}
+
+} // namespace cdef

@@ -63,8 +63,13 @@ line without_text(std::string_view whole) {
     return {.whole = whole, .kind = line_kind::comment, .indent = indent, .comment = without_trailing_blanks(rest)};
 }
 
+/* Without the blanks at its end, the line would end with a carriage return, like those of files from other systems. */
+bool hides_return(std::string_view whole) {
+    return !whole.ends_with('\r') && without_trailing_blanks(whole).ends_with('\r');
+}
+
 line line_of(std::string_view whole, line_reader &reader) {
-    if (!is_short(whole) || whole.find('\0') != std::string_view::npos)
+    if (!is_short(whole) || whole.find('\0') != std::string_view::npos || hides_return(whole))
         return {.whole = whole};
     std::string_view text = reader.text_of(whole);
     if (text.empty())

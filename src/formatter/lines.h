@@ -14,7 +14,8 @@ enum class line_kind : std::uint8_t {
     comment,
     header,
     attribute,
-    verbatim /* longer than the compiler reads at once, with a NUL, or quotes without text: not changed */
+    verbatim /* longer than the compiler reads at once, with a NUL, a carriage return in front of
+              * blanks at its end, or quotes without text: not changed */
 };
 
 /* A line without its newline. The parts refer to the source; together, and with the blanks at the end of the line, they

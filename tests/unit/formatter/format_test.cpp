@@ -152,6 +152,11 @@ TEST(Format, KeepsCarriageReturns) {
         "\t# comment \r\n");
 }
 
+/* Without the blanks there would be a carriage return at the end of a line, which is something else. */
+TEST(Format, KeepsBlanksAfterACarriageReturn) {
+    EXPECT_EQ(after_class("  # comment\r \n"), "  # comment\r \n");
+}
+
 TEST(Format, KeepsSignsInsideQuotes) {
     constexpr std::string_view kept = "\nResourceVariableClass\n\tVariableClass=\"a  # b // c\"\n"
                                       "\tObservationInterval=9\n\tReportingInterval=9\n\tAlias=a/b # c\n";

@@ -19,6 +19,27 @@ void document::replace(const range &part, std::string_view by, encoding units) {
 
 void document::forget() {
     found.reset();
+    contents.reset();
+    called.reset();
+    database.reset();
+}
+
+const source_index::index &document::index() {
+    if (!contents)
+        contents = source_index::index_of(content);
+    return *contents;
+}
+
+const source_index::names &document::names() {
+    if (!called)
+        called = source_index::names_of(content, index());
+    return *called;
+}
+
+const compiled_source *document::compiled() {
+    if (!database)
+        database = compile(content, address);
+    return *database ? &**database : nullptr;
 }
 
 const std::vector<check::finding> &document::findings(const check::warning_set &wanted) {

@@ -3,6 +3,9 @@
 #define CDGEN_SERVER_DOCUMENT_H
 
 #include "check/check.h"
+#include "index/names.h"
+#include "index/stanzas.h"
+#include "server/compiled.h"
 #include "server/positions.h"
 
 #include <optional>
@@ -15,8 +18,8 @@ namespace lsp {
 /* A text that changes, and the places in it. */
 class document {
 public:
-    document(std::string called, int number, std::string whole)
-        : address(std::move(called)), revision(number), content(std::move(whole)), table(content) {}
+    document(std::string its_uri, int number, std::string whole)
+        : address(std::move(its_uri)), revision(number), content(std::move(whole)), table(content) {}
 
     const std::string &uri() const {
         return address;
@@ -51,10 +54,14 @@ public:
     /* What cdef check reports of the text. The text is checked once. */
     const std::vector<check::finding> &findings(const check::warning_set &wanted);
 
-    /* Whether they have been asked for since the text changed. */
-    bool is_checked() const {
-        return found.has_value();
-    }
+    /* What is where in the text. It is read once. */
+    const source_index::index &index();
+    const source_index::names &names();
+
+    /* What the text compiles to; null if it has errors. It is compiled once. */
+    const compiled_source *compiled();
+
+    /* What was found out of the text is found out anew when it is asked for. */
     void forget();
 
 private:
@@ -63,6 +70,9 @@ private:
     std::string content;
     line_table table;
     std::optional<std::vector<check::finding>> found;
+    std::optional<source_index::index> contents;
+    std::optional<source_index::names> called;
+    std::optional<std::optional<compiled_source>> database; /* set but empty: the text has errors */
 };
 
 /* All findings of a source in memory. */

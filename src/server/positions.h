@@ -3,6 +3,8 @@
 #ifndef CDGEN_SERVER_POSITIONS_H
 #define CDGEN_SERVER_POSITIONS_H
 
+#include "index/lines.h"
+
 #include <compare>
 #include <cstddef>
 #include <cstdint>
@@ -27,15 +29,7 @@ struct range {
 };
 
 /* Bytes of a text. */
-struct stretch {
-    std::size_t begin = 0;
-    std::size_t end = 0;
-
-    bool holds(std::size_t offset) const {
-        return begin <= offset && offset <= end;
-    }
-    friend bool operator==(const stretch &, const stretch &) = default;
-};
+using stretch = source_index::span;
 
 /* Where the lines of a text begin. The text is the caller's. */
 class line_table {

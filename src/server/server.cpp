@@ -2,7 +2,15 @@
 
 #include "server/server.h"
 
+#include "server/actions.h"
+#include "server/completion.h"
+#include "server/folding.h"
+#include "server/hover.h"
+#include "server/navigation.h"
+#include "server/rename.h"
+#include "server/symbols.h"
 #include "server/synchronisation.h"
+#include "server/tokens.h"
 
 #include <array>
 #include <exception>
@@ -18,7 +26,20 @@ struct request_row {
     json (*answer)(session &, const json &params);
 };
 
-constexpr std::array<request_row, 0> requests = {};
+constexpr std::array requests = {
+    request_row{"textDocument/hover", hover},
+    request_row{"textDocument/completion", completion},
+    request_row{"textDocument/definition", definition},
+    request_row{"textDocument/references", references},
+    request_row{"textDocument/documentHighlight", highlights},
+    request_row{"textDocument/documentSymbol", document_symbols},
+    request_row{"textDocument/foldingRange", folding_ranges},
+    request_row{"textDocument/semanticTokens/full", semantic_tokens},
+    request_row{"textDocument/semanticTokens/range", semantic_tokens_in_range},
+    request_row{"textDocument/prepareRename", prepare_rename},
+    request_row{"textDocument/rename", rename},
+    request_row{"textDocument/codeAction", code_actions},
+};
 
 struct notification_row {
     std::string_view method;
@@ -30,6 +51,23 @@ constexpr std::array notifications = {
     notification_row{"textDocument/didChange", did_change},
     notification_row{"textDocument/didClose", did_close},
 };
+
+/* What the server offers to a client. */
+json offers_to(const client_abilities &client) {
+    constexpr int INCREMENTAL = 2;
+    return {{"positionEncoding", client.units == encoding::utf8 ? "utf-8" : "utf-16"},
+            {"textDocumentSync", {{"openClose", true}, {"change", INCREMENTAL}, {"save", false}}},
+            {"hoverProvider", true},
+            {"completionProvider", {{"triggerCharacters", {"=", ",", "."}}}},
+            {"definitionProvider", true},
+            {"referencesProvider", true},
+            {"documentHighlightProvider", true},
+            {"documentSymbolProvider", true},
+            {"foldingRangeProvider", true},
+            {"semanticTokensProvider", {{"legend", token_legend()}, {"full", true}, {"range", true}}},
+            {"renameProvider", {{"prepareProvider", true}}},
+            {"codeActionProvider", {{"codeActionKinds", {"quickfix", "refactor.rewrite", "source.fixAll.cdef"}}}}};
+}
 
 const json *method_of(const json &message) {
     const json *method = optional_member(message, "method");

@@ -40,13 +40,6 @@ client_abilities abilities_in(const json &initialize) {
             .literal_actions = of.contains(json::json_pointer(document + "codeAction/codeActionLiteralSupport"))};
 }
 
-json offers_to(const client_abilities &client) {
-    constexpr int INCREMENTAL = 2;
-    json offers = {{"positionEncoding", client.units == encoding::utf8 ? "utf-8" : "utf-16"},
-                   {"textDocumentSync", {{"openClose", true}, {"change", INCREMENTAL}, {"save", false}}}};
-    return offers;
-}
-
 document &session::document_in(const json &params) {
     std::string uri = text_member(member(params, "textDocument"), "uri");
     auto found = open.find(key_of(uri));

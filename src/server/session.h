@@ -16,6 +16,14 @@
 
 namespace lsp {
 
+/* A message of a class. All are written as in the source. */
+struct message_number {
+    std::string uri;     /* the source's */
+    std::string catalog; /* its MessageCatalog */
+    std::string set;     /* its DescriptiveMessageSet */
+    std::string number;
+};
+
 /* What the server needs of the machine. */
 struct surroundings {
     /* The bytes of a file; nothing if it cannot be read. */
@@ -24,6 +32,8 @@ struct surroundings {
     std::function<std::vector<std::string>(const std::string &folder)> sources_in;
     std::string explanations; /* where the page about all codes is, a URI; empty: nowhere */
     std::string version;      /* of the program */
+    /* The text of a message. Empty as long as nothing reads catalogs. */
+    std::function<std::optional<std::string>(const message_number &)> message_text = {};
 };
 
 /* What the client has said of itself. */
@@ -42,9 +52,6 @@ struct client_abilities {
 };
 
 client_abilities abilities_in(const json &initialize);
-
-/* What the server offers to such a client. */
-json offers_to(const client_abilities &client);
 
 struct session {
     explicit session(surroundings machine) : world(std::move(machine)) {

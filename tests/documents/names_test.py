@@ -95,6 +95,38 @@ class Language(Names):
         (found,) = [rows for head, *rows in tables(dict(chapters(LANGUAGE, 2))["Names"]) if head[0] == first]
         return found
 
+    def meanings(self, of):
+        """name -> meaning, of those that the program lists under a word."""
+        return {name: " ".join(text) for kind, name, *text in self.names["meaning"] if kind == of and text}
+
+    def test_each_attribute_has_its_meaning(self):
+        """The documents, and what editors show, have the same words."""
+        earlier = {}
+        for stanza, rows in self.stanza_chapters().items():
+            said = {}
+            for row in rows[1:]:
+                text = re.sub(r"\[([^]]*)\]\([^)]*\)", r"\1", row[-1])
+                said.update((name, earlier[name] if text == "as above" else text) for name in spans(row[0]))
+            self.assertEqual(said, self.meanings(stanza), stanza)
+            earlier = said
+
+    def test_each_stanza_has_its_meaning(self):
+        said = {}
+        for table in tables(dict(chapters(LANGUAGE, 2))["Stanzas"]):
+            if table[0][-1] in ("what it is", "structure that it describes"):
+                said.update((name, text) for kind, text in table[1:] for name in spans(kind))
+        self.assertEqual(said, self.meanings("stanza"))
+
+    def test_types_and_words_have_their_meanings(self):
+        value, default = {}, {}
+        for names, text, without, *_ in tables(dict(chapters(LANGUAGE, 2))["Data types"])[0][1:]:
+            for name in spans(names):
+                value[name], default[name] = text, without
+        del value["SBS"], default["SBS"]  # which is refused
+        self.assertEqual((value, default), (self.meanings("value"), self.meanings("default")))
+        said = {name: text for names, text in self.words("word") for name in spans(names)}
+        self.assertEqual({name: said[name] for name in self.meanings("word")}, self.meanings("word"))
+
     def test_properties(self):
         said = []
         for row in self.words("class property"):

@@ -8,60 +8,24 @@
  *   type NAME
  *   variable NAME
  *   field RECORD NAME
+ *   meaning STANZA ATTRIBUTE TEXT, and with stanza, value, default or word in the place of the stanza
  *
  * FORM is the form of the value, as the language's document calls it: words, or nothing where every value is refused.
  */
 
 #include "cdb_fields.h"
 #include "compiler/cdgen.h"
+#include "language/meanings.h"
 
 #include <cstdio>
 
 namespace {
 
-struct form {
-    int type; /* attr_type */
-    const char *name;
-};
-
-constexpr form forms[] = {
-    {AT_UINT16, "number16"},
-    {AT_VALUE_DISPLAY, "number16"},
-    {AT_SD_DESCRIPTION, "number16"},
-    {AT_SD_DISPLAY, "number16"},
-    {AT_SD_VALUE_DISPLAY, "number16"},
-    {AT_ID, "number32"},
-    {AT_STRING, "text"},
-    {AT_MANAGER, "text"},
-    {AT_LOCATOR, "text"},
-    {AT_SD_NAME, "text"},
-    {AT_CLASS_PROPS, "names"},
-    {AT_PATTR_PROPS, "names"},
-    {AT_DATTR_PROPS, "names"},
-    {AT_ACTION_PROPS, "names"},
-    {AT_VERSION, "version"},
-    {AT_VARIETY, "low,high"},
-    {AT_RANGE, "two values with ,: low,high"},
-    {AT_DATA_TYPE, "type"},
-    {AT_SD_DATA_TYPE, "type"},
-    {AT_VARIABLE_TYPE, "Counter, Quantity, State or Quantum"},
-    {AT_DEFAULT_VALUE, "value"},
-    {AT_INITIAL_VALUE, "value"},
-    {AT_VALID_VALUE, "value(s)"},
-    {AT_SD_VALID_VALUE, "value(s)"},
-    {AT_SD_INDEX, "decimal number"},
-    {AT_PERMISSION, "a letter"},
-    {AT_PERM_TEMPLATE, "anything"},
-    {AT_LIST_ACTION_CLASS, "anything"},
-    {AT_LIST_ACTION_RSRC, "anything"},
-    {AT_SD_DEFAULT_VALUE, ""},
-};
-
-const char *form_of(int type) {
-    for (const form &f : forms)
-        if (f.type == type)
-            return f.name;
-    return "of no name";
+/* "KIND NAME text", without line breaks. */
+void list_meaning(const char *of, std::string_view name, std::string_view text, std::string_view without = {}) {
+    std::printf("meaning %s %.*s %.*s%s%.*s\n", of, static_cast<int>(name.size()), name.data(),
+                static_cast<int>(text.size()), text.data(), without.empty() ? "" : "; without this line ",
+                static_cast<int>(without.size()), without.data());
 }
 
 void list_stanzas() {
@@ -71,7 +35,7 @@ void list_stanzas() {
         for (const table_attrs &attr : stanza.sc_attrs)
             std::printf("attribute %s %s %s %s %s\n", stanza.sc_name, attr.ta_name,
                         (attr.req_bit & OPTIONAL) != 0 ? "optional" : "required",
-                        attr.dup_allowed != 0 ? "repeats" : "once", form_of(attr.ta_type));
+                        attr.dup_allowed != 0 ? "repeats" : "once", language::form_of(attr.ta_type).name.data());
 }
 
 void list_properties(const char *of, std::span<const props_t> props) {
@@ -91,6 +55,25 @@ void list_words() {
             std::printf("type %s\n", vxTypeStr[type]);
     for (const char *variable : vxVarStr)
         std::printf("variable %s\n", variable);
+}
+
+void list_meanings() {
+    for (const srtable_ctrl &stanza : std::span(sc_tables).first(SC_COUNT)) {
+        list_meaning("stanza", stanza.sc_name, language::meaning_of(stanza));
+        for (const table_attrs &attr : stanza.sc_attrs) {
+            const language::attribute_meaning &row = language::meaning_of(stanza, attr);
+            list_meaning(stanza.sc_name, attr.ta_name, row.meaning, row.without);
+        }
+    }
+    for (const char *name : vxTypeStr)
+        if (const language::type_meaning *type = language::type_called(name)) {
+            list_meaning("value", name, type->value);
+            list_meaning("default", name, type->without);
+        }
+    for (const char *variable : vxVarStr)
+        list_meaning("word", variable, language::meaning_of_word(variable));
+    for (const props_t &property : pa_props)
+        list_meaning("word", property.s, language::meaning_of_word(property.s));
 }
 
 void list_fields(const char *record, std::span<const cdb::field> fields) {
@@ -131,6 +114,7 @@ void list_records() {
 int main() {
     list_stanzas();
     list_words();
+    list_meanings();
     list_records();
     return std::fflush(stdout) != 0;
 }

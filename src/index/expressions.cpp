@@ -1,0 +1,65 @@
+/* expressions.cpp: the names in an expression. */
+
+#include "index/expressions.h"
+
+#include <algorithm>
+#include <cctype>
+
+namespace source_index {
+
+namespace {
+
+/* A letter of any script: other bytes than ASCII's are parts of letters. */
+bool is_letter(char c) {
+    auto byte = static_cast<unsigned char>(c);
+    return std::isalnum(byte) != 0 || c == '_' || byte >= 0x80;
+}
+
+bool is_digit(char c) {
+    return c >= '0' && c <= '9';
+}
+
+/* Where the text in quotes that begins here ends, with its closing quote. */
+std::size_t end_of_quoted(std::string_view text, std::size_t open) {
+    for (std::size_t at = open + 1; at < text.size(); ++at) {
+        if (text[at] == '\\')
+            ++at;
+        else if (text[at] == text[open])
+            return at + 1;
+    }
+    return text.size();
+}
+
+std::size_t end_of_word(std::string_view text, std::size_t begin) {
+    return static_cast<std::size_t>(
+        std::find_if_not(text.begin() + static_cast<std::ptrdiff_t>(begin), text.end(), is_letter) - text.begin());
+}
+
+} // namespace
+
+std::vector<expression_name> names_in(std::string_view expression) {
+    std::vector<expression_name> found;
+    std::size_t member_at = std::string_view::npos; /* where a word would be an element of the name before it */
+    for (std::size_t at = 0; at < expression.size();) {
+        char c = expression[at];
+        if (c == '"' || c == '\'') {
+            at = end_of_quoted(expression, at);
+        } else if (is_letter(c)) {
+            std::size_t end = end_of_word(expression, at);
+            if (!is_digit(c))
+                found.push_back({{at, end}, at == member_at});
+            bool has_member = !is_digit(c) && end < expression.size() && expression[end] == '.';
+            member_at = has_member ? end + 1 : std::string_view::npos;
+            at = end;
+        } else {
+            at += c == '\\' ? 2 : 1;
+        }
+    }
+    return found;
+}
+
+bool is_expression_name(std::string_view text) {
+    return !text.empty() && !is_digit(text.front()) && std::all_of(text.begin(), text.end(), is_letter);
+}
+
+} // namespace source_index

@@ -1,0 +1,25 @@
+/* expressions.h: the names in an expression. Its grammar is the runtime's; what looks like a name is taken for one. */
+#ifndef CDGEN_INDEX_EXPRESSIONS_H
+#define CDGEN_INDEX_EXPRESSIONS_H
+
+#include "index/lines.h"
+
+#include <string_view>
+#include <vector>
+
+namespace source_index {
+
+struct expression_name {
+    span at;             /* in the expression */
+    bool member = false; /* it is an element of the name before it: a point is between them */
+};
+
+/* The words of an expression that are outside of quotes and do not begin with a digit. */
+std::vector<expression_name> names_in(std::string_view expression);
+
+/* Whether a text is one such word. */
+bool is_expression_name(std::string_view text);
+
+} // namespace source_index
+
+#endif

@@ -1,0 +1,153 @@
+/* stanzas.cpp: the stanzas of a source and their attributes. */
+
+#include "index/stanzas.h"
+
+#include <algorithm>
+#include <charconv>
+#include <limits>
+#include <system_error>
+
+namespace source_index {
+
+namespace {
+
+/* The stanza that a run of elements after these stanzas describes. */
+std::size_t owner_of_run(const std::vector<stanza> &before, const srtable_ctrl &kind) {
+    bool of_attribute = kind.sc_sd_owner->is_attribute();
+    bool of_action = kind.sc_sd_owner->of_action != nullptr;
+    for (std::size_t at = before.size(); at-- > 0 && (of_attribute || of_action);) {
+        const stanza &earlier = before[at];
+        if (earlier.is_element() && of_action)
+            continue;
+        bool is_attribute = earlier.is_known() && earlier.row().sc_attr != nullptr;
+        bool is_action = earlier.kind == SC_CLASS_ACTION || earlier.kind == SC_RESOURCE_ACTION;
+        return (of_attribute ? is_attribute : is_action) ? at : NONE;
+    }
+    return NONE;
+}
+
+void begin_stanza(index &to, std::string_view source, std::size_t line_number) {
+    stanza one;
+    one.header = to.lines[line_number].text;
+    one.kind = set_table_id(one.header.of(source));
+    one.first_line = one.last_line = line_number;
+    one.class_number = to.stanzas.empty() ? 0 : to.stanzas.back().class_number;
+    if (one.kind == SC_CONTROL_DEFINITION)
+        ++one.class_number;
+    if (one.is_element()) {
+        bool continues = !to.stanzas.empty() && to.stanzas.back().kind == one.kind;
+        one.run = continues ? to.stanzas.back().run : to.stanzas.size();
+        one.owner = continues ? to.stanzas.back().owner : owner_of_run(to.stanzas, one.row());
+    }
+    to.stanzas.push_back(std::move(one));
+}
+
+void add_attribute(index &to, std::string_view source, std::size_t line_number) {
+    if (to.stanzas.empty())
+        return;
+    stanza &current = to.stanzas.back();
+    attribute one;
+    one.line = current.last_line = line_number;
+    one.parts = parts_of(source, to.lines[line_number].text);
+    if (current.is_known())
+        one.known = find_attr(current.row(), one.parts.name.of(source));
+    current.attributes.push_back(one);
+}
+
+/* Kinds of one family have one sequence of numbers. */
+int number_family(int kind) {
+    switch (kind) {
+    case SC_DYNAMIC_RESOURCE_ATTRIBUTE:
+        return SC_PERSISTENT_RESOURCE_ATTRIBUTE;
+    case SC_DYNAMIC_CLASS_ATTRIBUTE:
+        return SC_PERSISTENT_CLASS_ATTRIBUTE;
+    default:
+        return kind;
+    }
+}
+
+/* Nothing for a text that is not a decimal number which a record can hold. */
+std::optional<long long> number_in(std::string_view text) {
+    long long number = 0;
+    auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+    bool fits = error == std::errc() && number >= 0 && number < std::numeric_limits<vx_int32_t>::max();
+    return fits && end != text.data() ? std::optional(number) : std::nullopt;
+}
+
+} // namespace
+
+const attribute *stanza::find(std::string_view name) const {
+    auto found = std::find_if(attributes.begin(), attributes.end(), [&](const attribute &each) {
+        return each.known != nullptr && std::string_view(each.known->ta_name) == name;
+    });
+    return found == attributes.end() ? nullptr : &*found;
+}
+
+std::string_view stanza::value(std::string_view source, std::string_view name) const {
+    const attribute *found = find(name);
+    return found == nullptr ? std::string_view() : found->parts.value.of(source);
+}
+
+vx_uint32_t stanza::required_seen() const {
+    vx_uint32_t seen = 0;
+    for (const attribute &each : attributes)
+        if (each.known != nullptr && (each.known->req_bit & OPTIONAL) == 0)
+            seen |= each.known->req_bit;
+    return seen;
+}
+
+std::size_t index::line_at(std::size_t offset) const {
+    auto after = std::upper_bound(lines.begin(), lines.end(), offset,
+                                  [](std::size_t at, const line &each) { return at < each.whole.begin; });
+    return after == lines.begin() ? 0 : static_cast<std::size_t>(after - lines.begin()) - 1;
+}
+
+std::size_t index::stanza_at(std::size_t line_number) const {
+    auto after = std::upper_bound(stanzas.begin(), stanzas.end(), line_number,
+                                  [](std::size_t at, const stanza &each) { return at < each.first_line; });
+    return after == stanzas.begin() ? NONE : static_cast<std::size_t>(after - stanzas.begin()) - 1;
+}
+
+const attribute *index::attribute_at(std::size_t line_number) const {
+    std::size_t at = stanza_at(line_number);
+    if (at == NONE)
+        return nullptr;
+    for (const attribute &each : stanzas[at].attributes)
+        if (each.line == line_number)
+            return &each;
+    return nullptr;
+}
+
+span index::extent_of(const stanza &of) const {
+    return {lines[of.first_line].whole.begin, lines[of.last_line].whole.end};
+}
+
+/* An element's number is its index, which counts from 0 in its run. */
+std::optional<long long> index::next_id(std::string_view source, const stanza &of) const {
+    std::string_view name = of.is_element() ? "ElementIndex" : "Id";
+    if (!of.is_known() || find_attr(of.row(), name) == nullptr)
+        return std::nullopt;
+    long long highest = -1;
+    for (const stanza &each : stanzas) {
+        bool counts = of.is_element()
+                          ? each.run == of.run
+                          : each.class_number == of.class_number && number_family(each.kind) == number_family(of.kind);
+        if (counts && &each != &of)
+            highest = std::max(highest, number_in(each.value(source, name)).value_or(-1));
+    }
+    return highest + 1;
+}
+
+index index_of(std::string_view source) {
+    index made;
+    made.lines = lines_of(source);
+    for (std::size_t at = 0; at < made.lines.size(); ++at) {
+        if (made.lines[at].kind == line_kind::header)
+            begin_stanza(made, source, at);
+        else if (made.lines[at].kind == line_kind::attribute)
+            add_attribute(made, source, at);
+    }
+    return made;
+}
+
+} // namespace source_index

@@ -1,0 +1,221 @@
+/* actions.cpp: changes that an editor offers at a place. */
+
+#include "server/actions.h"
+
+#include "check/fix.h"
+#include "language/suggestions.h"
+#include "server/examples.h"
+#include "server/places.h"
+
+#include <algorithm>
+
+namespace lsp {
+
+namespace {
+
+constexpr std::string_view QUICK_FIX = "quickfix";
+constexpr std::string_view REWRITE = "refactor.rewrite";
+constexpr std::string_view FIX_ALL = "source.fixAll.cdef";
+
+/* Whether the client wants actions of a kind: it names kinds that contain them, or none. */
+bool is_wanted(const json &params, std::string_view kind) {
+    const json *context = optional_member(params, "context");
+    const json *only = context == nullptr ? nullptr : optional_member(*context, "only");
+    if (only == nullptr || !only->is_array())
+        return true;
+    return std::any_of(only->begin(), only->end(), [&](const json &each) {
+        if (!each.is_string())
+            return false;
+        std::string wanted = each.get<std::string>();
+        return wanted.empty() || kind == wanted || kind.starts_with(wanted + ".");
+    });
+}
+
+/* What a request asks about, and the actions for it. */
+class collector {
+public:
+    collector(session &of, document &about, const json &asked)
+        : now(of), in(about), params(asked),
+          part(about.stretch_of(range_from(member(asked, "range")), of.client.units)) {}
+
+    json collect() {
+        if (is_wanted(params, QUICK_FIX)) {
+            add_corrections();
+            add_missing_lines();
+            add_free_number();
+        }
+        if (is_wanted(params, REWRITE))
+            add_quotes();
+        if (is_wanted(params, FIX_ALL))
+            add_all_corrections();
+        return std::move(all);
+    }
+
+private:
+    json &add(std::string_view title, std::string_view kind, json edits) {
+        all.push_back({{"title", title}, {"kind", kind}, {"edit", workspace_edit(now, in, std::move(edits))}});
+        return all.back();
+    }
+    json edit(const stretch &at, std::string_view by) const {
+        position_maker positions = in.positions(now.client.units);
+        return text_edit(positions, at, by);
+    }
+    json change(const finding_places &places, const check::edit &made) const;
+    void add_corrections();
+    void add_missing_lines();
+    void add_free_number();
+    void add_quotes();
+    void add_all_corrections();
+
+    session &now;
+    document &in;
+    const json &params;
+    stretch part;
+    json all = json::array();
+};
+
+/* A position cannot be between a carriage return and a newline: the edit then covers both. */
+json collector::change(const finding_places &places, const check::edit &made) const {
+    std::string_view source = in.text();
+    auto splits = [&](std::size_t at) {
+        return at > 0 && at < source.size() && source[at - 1] == '\r' && source[at] == '\n';
+    };
+    stretch at = places.of(made);
+    std::string text = made.text;
+    if (splits(at.end)) {
+        ++at.end;
+        text += '\n';
+    }
+    if (splits(at.begin)) {
+        --at.begin;
+        text.insert(0, "\r");
+    }
+    return edit(at, text);
+}
+
+std::string title_of(const check::finding &found) {
+    const std::vector<check::edit> &edits = found.fix.edits;
+    if (edits.size() != 1)
+        return "Correct " + std::to_string(edits.size()) + " places";
+    const check::edit &one = edits.front();
+    auto shown = [](std::string_view text) {
+        return text.find('\n') == text.npos ? language::quoted(text) : std::string("a line");
+    };
+    if (one.text.find_first_not_of("\r\n") == std::string::npos)
+        return one.removed.find_first_not_of("\r\n\t ") == std::string::npos ? "Remove blanks"
+                                                                             : "Remove " + shown(one.removed);
+    return one.removed.empty() ? "Insert " + shown(one.text)
+                               : "Replace " + shown(one.removed) + " with " + shown(one.text);
+}
+
+/* Every correction that a finding in the range carries. */
+void collector::add_corrections() {
+    finding_places places(in.text());
+    const std::vector<check::finding> &findings = in.findings(now.wanted);
+    for (const check::finding &each : findings) {
+        stretch at = places.of(each.at);
+        if (each.fix.edits.empty() || at.begin > part.end || at.end < part.begin)
+            continue;
+        json edits = json::array();
+        for (const check::edit &made : each.fix.edits)
+            edits.push_back(change(places, made));
+        json &action = add(title_of(each), QUICK_FIX, std::move(edits));
+        action["diagnostics"] = diagnostics_of(in.text(), in.lines(), in.uri(), {&each, 1}, now.form());
+        if (each.fix.sure == check::certainty::certain)
+            action["isPreferred"] = true;
+    }
+}
+
+/* After the required lines that the stanza has: those that are optional follow. */
+std::size_t line_before_missing(const source_index::stanza &of) {
+    std::size_t line = of.first_line;
+    for (const source_index::attribute &each : of.attributes) {
+        if (each.known == nullptr || (each.known->req_bit & OPTIONAL) != 0)
+            break;
+        line = each.line;
+    }
+    return line;
+}
+
+void collector::add_missing_lines() {
+    place_in_source place = place_at(in, part.begin);
+    if (place.stanza == nullptr || !place.stanza->is_known())
+        return;
+    std::vector<const table_attrs *> missing = missing_in(*place.stanza);
+    if (missing.empty())
+        return;
+    std::string lines;
+    language::name_list names;
+    for (const table_attrs *each : missing) {
+        lines += "\n\t" + std::string(each->ta_name) + "=" + example_value(in.text(), in.index(), *place.stanza, *each);
+        names.push_back(each->ta_name);
+    }
+    std::size_t end = in.index().lines[line_before_missing(*place.stanza)].whole.end;
+    add("Add " + language::listed(names), QUICK_FIX, json::array({edit({end, end}, lines)}));
+}
+
+void collector::add_free_number() {
+    place_in_source place = place_at(in, part.begin);
+    bool numbered = place.has_known_attribute() && place.attribute->parts.has_equals &&
+                    (place.attribute->known->ta_type == AT_ID || place.attribute->known->ta_type == AT_SD_INDEX);
+    if (!numbered)
+        return;
+    std::string next = example_value(in.text(), in.index(), *place.stanza, *place.attribute->known);
+    if (place.attribute->parts.value.of(in.text()) != next)
+        add("Use the next free number, " + next, QUICK_FIX, json::array({edit(place.attribute->parts.value, next)}));
+}
+
+/* Only where the value stays the same. */
+void collector::add_quotes() {
+    place_in_source place = place_at(in, part.begin);
+    if (place.attribute == nullptr || place.attribute->parts.quoted || place.attribute->parts.value.is_empty())
+        return;
+    std::string_view value = place.attribute->parts.value.of(in.text());
+    const source_index::line &line = in.index().lines[place.line];
+    std::string quotes = "\"" + std::string(value) + "\"";
+    std::string after = in.text().substr(line.whole.begin, place.attribute->parts.value.begin - line.whole.begin) +
+                        quotes + in.text().substr(line.text.end, line.whole.end - line.text.end);
+    std::vector<source_index::line> read = source_index::lines_of(after);
+    if (read.size() == 1 && source_index::parts_of(after, read[0].text).value.of(after) == value)
+        add("Put the value in quotes", REWRITE, json::array({edit(place.attribute->parts.value, quotes)}));
+}
+
+/* Where two texts differ: what is between their common beginning and their common end. */
+struct difference {
+    stretch old_part;
+    stretch new_part;
+};
+
+difference difference_of(std::string_view before, std::string_view after) {
+    auto first = static_cast<std::size_t>(
+        std::mismatch(before.begin(), before.end(), after.begin(), after.end()).first - before.begin());
+    std::size_t begin = before.substr(0, first).rfind('\n') + 1;
+    std::size_t shorter = std::min(before.size(), after.size()) - begin;
+    std::size_t end = 0;
+    while (end < shorter && before[before.size() - 1 - end] == after[after.size() - 1 - end])
+        ++end;
+    while (end > 0 && before[before.size() - end] != '\n')
+        --end;
+    end -= end > 0 ? 1 : 0; /* a line's end is not taken apart */
+    return {{begin, before.size() - end}, {begin, after.size() - end}};
+}
+
+void collector::add_all_corrections() {
+    const std::string &before = in.text();
+    check::fixed_source fixed = check::fix_bytes(before, "source", now.wanted);
+    if (fixed.text == before)
+        return;
+    difference made = difference_of(before, fixed.text);
+    add("Correct all that is certain", FIX_ALL, json::array({edit(made.old_part, made.new_part.of(fixed.text))}));
+}
+
+} // namespace
+
+json code_actions(session &now, const json &params) {
+    document &in = now.document_in(params);
+    if (!now.client.literal_actions)
+        return json::array();
+    return collector(now, in, params).collect();
+}
+
+} // namespace lsp

@@ -1,0 +1,14 @@
+/* actions.h: changes that an editor offers at a place: corrections of findings, lines that are missing, numbers that
+ * are free, quotes. */
+#ifndef CDGEN_SERVER_ACTIONS_H
+#define CDGEN_SERVER_ACTIONS_H
+
+#include "server/session.h"
+
+namespace lsp {
+
+json code_actions(session &now, const json &params);
+
+} // namespace lsp
+
+#endif

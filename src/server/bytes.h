@@ -1,0 +1,25 @@
+/* bytes.h: where in a database the record of a stanza is. */
+#ifndef CDGEN_SERVER_BYTES_H
+#define CDGEN_SERVER_BYTES_H
+
+#include "index/stanzas.h"
+
+#include <cstddef>
+#include <optional>
+#include <span>
+#include <string>
+#include <string_view>
+
+namespace lsp {
+
+/* The offset of the record that a stanza became, in bytes from the start of the file. Nothing if there is none, or if
+ * it cannot be told from others. image: what the source compiles to. */
+std::optional<std::size_t> record_offset(std::string_view source, const source_index::index &of, std::size_t stanza,
+                                         std::span<const std::byte> image);
+
+/* Bytes in hexadecimal with blanks between them; three points stand for those after the first 16. */
+std::string hexadecimal(std::span<const std::byte> bytes);
+
+} // namespace lsp
+
+#endif

@@ -1,0 +1,346 @@
+/* completion.cpp: what may be written at a place. */
+
+#include "server/completion.h"
+
+#include "format/names.h"
+#include "index/expressions.h"
+#include "language/names.h"
+#include "server/documentation.h"
+#include "server/examples.h"
+#include "server/places.h"
+
+#include <algorithm>
+#include <set>
+
+namespace lsp {
+
+namespace {
+
+using source_index::name_kind;
+using source_index::stanza;
+
+/* Kinds of items. */
+constexpr int PROPERTY = 10;
+constexpr int VALUE = 12;
+constexpr int ENUM_MEMBER = 20;
+constexpr int STRUCT = 22;
+constexpr int VARIABLE = 6;
+
+/* Collects items that replace one part of the source. */
+class items {
+public:
+    items(const session &of, const place_in_source &at, const stretch &replaced)
+        : now(of), part(to_json(at.in.positions(of.client.units).of(replaced))) {}
+
+    /* text: what is inserted. Items are shown in the order in which they are added. */
+    json &add(std::string_view label, int kind, std::string_view text, const std::string &documentation) {
+        constexpr std::size_t DIGITS = 4;
+        std::string order = std::to_string(all.size());
+        json item = {{"label", label},
+                     {"kind", kind},
+                     {"sortText", std::string(DIGITS - std::min(DIGITS, order.size()), '0') + order},
+                     {"filterText", label},
+                     {"textEdit", {{"range", part}, {"newText", text}}}};
+        if (!documentation.empty())
+            item["documentation"] = {{"kind", "markdown"}, {"value", documentation}};
+        all.push_back(std::move(item));
+        return all.back();
+    }
+    /* The text is a snippet if the client takes one. */
+    json &add_snippet(std::string_view label, int kind, std::string_view text, const std::string &documentation) {
+        constexpr int AS_IT_IS = 1; /* insertTextMode: the client does not indent it */
+        json &item = add(label, kind, text, documentation);
+        item["insertTextMode"] = AS_IT_IS;
+        if (takes_snippets())
+            item["insertTextFormat"] = 2;
+        return item;
+    }
+    bool takes_snippets() const {
+        return now.client.snippets;
+    }
+    json take() {
+        return std::move(all);
+    }
+
+private:
+    const session &now;
+    json part;
+    json all = json::array();
+};
+
+/* ---- Stanzas ---------------------------------------------------------------------------------------------------- */
+
+bool is_kind_before(const place_in_source &place, int kind) {
+    const std::vector<stanza> &all = place.in.index().stanzas;
+    return std::any_of(all.begin(), all.end(), [&](const stanza &each) {
+        return each.kind == kind && place.in.index().lines[each.first_line].whole.begin < place.offset &&
+               each.first_line != place.line;
+    });
+}
+
+/* The latest stanza before the line. */
+const stanza *stanza_before(const place_in_source &place) {
+    const stanza *latest = nullptr;
+    for (const stanza &each : place.in.index().stanzas)
+        if (each.first_line < place.line)
+            latest = &each;
+    return latest;
+}
+
+/* Whether a run of elements may begin or continue after a stanza. */
+bool may_follow(const place_in_source &place, const srtable_ctrl &kind, const stanza *before) {
+    if (before == nullptr || !before->is_known())
+        return false;
+    const sd_owner &who = *kind.sc_sd_owner;
+    if (who.of_class != nullptr || &before->row() == &kind)
+        return true;
+    if (who.of_action != nullptr)
+        return before->kind == SC_CLASS_ACTION || before->kind == SC_RESOURCE_ACTION ||
+               (before->is_element() && before->row().sc_sd_owner->of_action != nullptr);
+    bool structured = before->value(place.text(), "DataType").starts_with("SD");
+    bool persistent = before->kind == SC_PERSISTENT_RESOURCE_ATTRIBUTE || before->kind == SC_PERSISTENT_CLASS_ATTRIBUTE;
+    return structured && before->row().sc_attr != nullptr && persistent == (who.type == SD_TYPE_PATTR);
+}
+
+bool may_begin(const place_in_source &place, int kind) {
+    const srtable_ctrl &row = sc_tables[static_cast<std::size_t>(kind)];
+    switch (kind) {
+    case SC_CONTROL_DEFINITION:
+    case SC_CLASS_TO_MANAGER_MAPPING:
+    case SC_RESOURCE_CLASS:
+        return !is_kind_before(place, kind) &&
+               (kind != SC_RESOURCE_CLASS || is_kind_before(place, SC_CONTROL_DEFINITION));
+    case SC_RESOURCE_VARIABLE_CLASS:
+        return true;
+    default:
+        return is_kind_before(place, SC_CONTROL_DEFINITION) &&
+               (row.sc_sd_owner == nullptr || may_follow(place, row, stanza_before(place)));
+    }
+}
+
+/* What begins a snippet's place has to be escaped in it. */
+std::string escaped(std::string_view text) {
+    std::string safe;
+    for (char c : text) {
+        if (c == '$' || c == '}' || c == '\\')
+            safe += '\\';
+        safe += c;
+    }
+    return safe;
+}
+
+/* The header and the required lines, in order, with values to be replaced. */
+std::string stanza_text(const place_in_source &place, int kind, bool snippet) {
+    stanza fresh;
+    fresh.kind = kind;
+    const stanza *before = stanza_before(place);
+    fresh.class_number = before == nullptr ? 0 : before->class_number;
+    if (fresh.is_element() && before != nullptr && before->kind == kind)
+        fresh.run = before->run;
+    std::string text = fresh.row().sc_name;
+    int number = 0;
+    for (const table_attrs *each : missing_in(fresh)) {
+        std::string value = example_value(place.text(), place.in.index(), fresh, *each);
+        text.append("\n\t").append(each->ta_name).append("=");
+        text += snippet ? "${" + std::to_string(++number) + ":" + escaped(value) + "}" : value;
+    }
+    return text + (snippet ? "$0" : "");
+}
+
+void add_stanzas(items &to, const place_in_source &place) {
+    for (int kind = 0; kind < SC_COUNT; ++kind) {
+        const srtable_ctrl &row = sc_tables[static_cast<std::size_t>(kind)];
+        if (may_begin(place, kind))
+            to.add_snippet(row.sc_name, STRUCT, stanza_text(place, kind, to.takes_snippets()),
+                           stanza_documentation(row));
+    }
+}
+
+/* ---- Attributes ------------------------------------------------------------------------------------------------- */
+
+bool is_given(const place_in_source &place, const table_attrs &attr) {
+    const auto &given = place.stanza->attributes;
+    return std::any_of(given.begin(), given.end(),
+                       [&](const auto &each) { return each.known == &attr && each.line != place.line; });
+}
+
+/* Whether all required attributes come before the line, so that optional ones may follow. */
+bool takes_optional(const place_in_source &place) {
+    vx_uint32_t seen = 0;
+    for (const source_index::attribute &each : place.stanza->attributes)
+        if (each.known != nullptr && each.line < place.line && (each.known->req_bit & OPTIONAL) == 0)
+            seen |= each.known->req_bit;
+    return seen == place.stanza->row().req_mask_cmplt;
+}
+
+void add_attributes(items &to, const place_in_source &place) {
+    bool has_equals = place.attribute != nullptr && place.attribute->parts.has_equals;
+    bool optional_too = takes_optional(place);
+    for (bool required : {true, false})
+        for (const table_attrs &each : place.stanza->row().sc_attrs) {
+            bool is_required = (each.req_bit & OPTIONAL) == 0;
+            bool fits = is_required || optional_too;
+            bool refused = each.ta_type == AT_SD_DEFAULT_VALUE;
+            bool again = is_given(place, each);
+            if (is_required != required || !fits || refused || (again && each.dup_allowed == 0))
+                continue;
+            bool numbered = each.ta_type == AT_ID || each.ta_type == AT_SD_INDEX;
+            std::string text = each.ta_name;
+            if (!has_equals)
+                text += "=";
+            if (!has_equals && numbered)
+                text += example_value(place.text(), place.in.index(), *place.stanza, each);
+            json &item = to.add(each.ta_name, PROPERTY, text, attribute_documentation(place.stanza->row(), each));
+            item["detail"] = is_required ? "required" : "optional";
+        }
+}
+
+/* ---- Values ----------------------------------------------------------------------------------------------------- */
+
+void add_values(items &to, const language::name_list &names, const table_attrs &attr, int kind) {
+    for (std::string_view name : names)
+        to.add(name, kind, name, value_documentation(attr, name));
+}
+
+void add_names(items &to, const place_in_source &place, name_kind kind, std::size_t scope) {
+    for (const std::string &name : source_index::names_for(place.in.names(), kind, scope))
+        to.add(name, VARIABLE, name, {});
+}
+
+/* Properties that the list does not have yet. */
+void add_properties(items &to, const place_in_source &place, const stretch &item) {
+    const table_attrs &attr = *place.attribute->known;
+    std::string_view list = place.attribute->parts.value.of(place.text());
+    std::size_t begin = item.begin - place.attribute->parts.value.begin;
+    std::string others(list.substr(0, begin));
+    std::size_t next = list.find(',', begin);
+    others += next == list.npos ? std::string_view() : list.substr(next);
+    std::string around = "," + others + ",";
+    for (std::string_view name : language::property_names(attr.ta_type))
+        if (around.find("," + std::string(name) + ",") == std::string::npos)
+            to.add(name, ENUM_MEMBER, name, value_documentation(attr, name));
+}
+
+/* Attributes of the class; after a point the elements of the attribute before it. */
+void add_expression_names(items &to, const place_in_source &place, const stretch &word) {
+    const source_index::names &names = place.in.names();
+    auto scope = static_cast<std::size_t>(place.stanza->class_number);
+    bool member = word.begin > 0 && place.text()[word.begin - 1] == '.';
+    if (!member) {
+        for (name_kind kind : {name_kind::dynamic_resource, name_kind::persistent_resource, name_kind::dynamic_class,
+                               name_kind::persistent_class})
+            add_names(to, place, kind, scope);
+        return;
+    }
+    const source_index::mention *before = names.at(word.begin - 1);
+    for (const stanza &each : place.in.index().stanzas) {
+        bool owned = before != nullptr && each.is_element() && each.owner != source_index::NONE &&
+                     each.owner < place.in.index().stanzas.size();
+        if (!owned)
+            continue;
+        std::string_view owner = place.in.index().stanzas[each.owner].value(place.text(), "Name");
+        if (owner == names.all[before->name].text)
+            to.add(each.value(place.text(), "ElementName"), VARIABLE, each.value(place.text(), "ElementName"), {});
+    }
+}
+
+/* A default is one of the values that the stanza calls valid. */
+void add_valid_values(items &to, const place_in_source &place) {
+    std::set<std::string_view> shown;
+    for (const source_index::attribute &each : place.stanza->attributes) {
+        bool valid = each.known != nullptr && each.known->ta_type == AT_VALID_VALUE;
+        std::string_view value = valid ? each.parts.value.of(place.text()) : std::string_view();
+        if (!value.empty() && value.find(',') == value.npos && shown.insert(value).second)
+            to.add(value, VALUE, value, {});
+    }
+}
+
+void add_by_type(items &to, const place_in_source &place, const stretch &part) {
+    const table_attrs &attr = *place.attribute->known;
+    const stanza &in = *place.stanza;
+    switch (attr.ta_type) {
+    case AT_DATA_TYPE:
+    case AT_SD_DATA_TYPE:
+        return add_values(to, language::data_type_names(in.is_element()), attr, ENUM_MEMBER);
+    case AT_VARIABLE_TYPE:
+        return add_values(to, language::variable_type_names(), attr, ENUM_MEMBER);
+    case AT_CLASS_PROPS:
+    case AT_PATTR_PROPS:
+    case AT_DATTR_PROPS:
+    case AT_ACTION_PROPS:
+        return add_properties(to, place, part);
+    case AT_LOCATOR:
+        return add_names(to, place, name_kind::persistent_resource,
+                         static_cast<std::size_t>(place.in.index().stanzas.back().class_number));
+    case AT_ID:
+    case AT_SD_INDEX: {
+        std::string next = example_value(place.text(), place.in.index(), in, attr);
+        to.add(next, VALUE, next, {})["detail"] = "next free number";
+        return;
+    }
+    case AT_PERMISSION:
+        for (const valid_perms_t &each : perm_list)
+            to.add({&each.permission, 1}, ENUM_MEMBER, {&each.permission, 1}, {});
+        return;
+    case AT_DEFAULT_VALUE:
+    case AT_INITIAL_VALUE:
+        return add_valid_values(to, place);
+    case AT_STRING:
+        if (std::string_view(attr.ta_name) == "VariableClass" && in.kind != SC_RESOURCE_VARIABLE_CLASS)
+            add_names(to, place, name_kind::variable_class, 0);
+        else if (std::string_view(attr.ta_name).ends_with("Expression"))
+            add_expression_names(to, place, part);
+        return;
+    default:
+        return;
+    }
+}
+
+/* The part of the value up to the place that an item replaces. */
+stretch value_part(const place_in_source &place) {
+    const table_attrs &attr = *place.attribute->known;
+    stretch part = {place.attribute->parts.value.begin, place.offset};
+    bool list = attr.ta_type == AT_CLASS_PROPS || attr.ta_type == AT_PATTR_PROPS || attr.ta_type == AT_DATTR_PROPS ||
+                attr.ta_type == AT_ACTION_PROPS;
+    bool expression = std::string_view(attr.ta_name).ends_with("Expression");
+    for (std::size_t at = place.offset; at > part.begin && (list || expression); --at) {
+        char before = place.text()[at - 1];
+        bool ends = list ? before == ',' : !source_index::is_expression_name("a" + std::string(1, before));
+        if (ends)
+            part.begin = at;
+    }
+    return part;
+}
+
+json value_items(const session &now, const place_in_source &place) {
+    stretch part = value_part(place);
+    items found(now, place, part);
+    add_by_type(found, place, part);
+    return found.take();
+}
+
+} // namespace
+
+json completion(session &now, const json &params) {
+    place_in_source place = place_in(now, params);
+    std::string_view source = place.text();
+    std::size_t begin = place.in.index().lines.empty() ? 0 : place.in.index().lines[place.line].whole.begin;
+    if (place.offset > 0 && source[place.offset - 1] == '\n')
+        begin = place.offset; /* the empty line at the end of a source */
+    std::string_view before = source.substr(begin, place.offset - begin);
+    std::size_t word = begin + std::min(before.find_first_not_of(" \t"), before.size());
+    if (place.in_comment)
+        return json::array();
+    bool in_value = place.has_known_attribute() && place.attribute->parts.has_equals &&
+                    place.offset >= place.attribute->parts.value.begin && begin != place.offset;
+    if (in_value)
+        return value_items(now, place);
+    items found(now, place, {word, place.offset});
+    if (word == begin)
+        add_stanzas(found, place);
+    else if (place.stanza != nullptr && place.stanza->is_known() && before.find('=') == before.npos)
+        add_attributes(found, place);
+    return found.take();
+}
+
+} // namespace lsp

@@ -1,0 +1,42 @@
+/* examples.cpp: values to begin with. */
+
+#include "server/examples.h"
+
+namespace lsp {
+
+std::string example_value(std::string_view source, const source_index::index &of, const source_index::stanza &in,
+                          const table_attrs &attr) {
+    switch (attr.ta_type) {
+    case AT_ID:
+    case AT_SD_INDEX:
+        return std::to_string(of.next_id(source, in).value_or(0));
+    case AT_VERSION:
+        return "1.0.0.0";
+    case AT_VARIETY:
+        return "1,1";
+    case AT_DATA_TYPE:
+    case AT_SD_DATA_TYPE:
+        return "String";
+    case AT_VARIABLE_TYPE:
+        return "Quantity";
+    case AT_CLASS_PROPS:
+        return "HasResources";
+    case AT_STRING:
+    case AT_SD_NAME:
+    case AT_MANAGER:
+        return "New" + std::string(attr.ta_name);
+    default:
+        return "0";
+    }
+}
+
+std::vector<const table_attrs *> missing_in(const source_index::stanza &in) {
+    std::vector<const table_attrs *> missing;
+    vx_uint32_t seen = in.required_seen();
+    for (const table_attrs &each : in.row().sc_attrs)
+        if ((each.req_bit & OPTIONAL) == 0 && (seen & each.req_bit) == 0)
+            missing.push_back(&each);
+    return missing;
+}
+
+} // namespace lsp

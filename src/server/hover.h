@@ -1,0 +1,13 @@
+/* hover.h: what the name or value at a place means, and what it becomes in the database. */
+#ifndef CDGEN_SERVER_HOVER_H
+#define CDGEN_SERVER_HOVER_H
+
+#include "server/session.h"
+
+namespace lsp {
+
+json hover(session &now, const json &params);
+
+} // namespace lsp
+
+#endif

@@ -1,0 +1,48 @@
+/* places.cpp: what is at the place in a document that a request names. */
+
+#include "server/places.h"
+
+namespace lsp {
+
+place_in_source place_at(document &in, std::size_t offset) {
+    const source_index::index &index = in.index();
+    std::size_t line = index.lines.empty() ? 0 : index.line_at(offset);
+    std::size_t stanza = index.stanza_at(line);
+    bool in_comment = false;
+    if (!index.lines.empty()) {
+        const source_index::line &on = index.lines[line];
+        std::string_view rest = std::string_view(in.text()).substr(on.text.end, on.whole.end - on.text.end);
+        std::size_t blanks = rest.find_first_not_of(" \t\r\"");
+        bool has_comment = on.kind == source_index::line_kind::comment || (!on.text.is_empty() && blanks != rest.npos);
+        std::size_t begin = on.text.is_empty() ? on.whole.begin : on.text.end + std::min(blanks, rest.size());
+        in_comment = has_comment && offset > begin && offset <= on.whole.end;
+    }
+    return {in,
+            offset,
+            line,
+            stanza == source_index::NONE ? nullptr : &index.stanzas[stanza],
+            index.attribute_at(line),
+            in_comment};
+}
+
+place_in_source place_in(session &now, const json &params) {
+    document &in = now.document_in(params);
+    return place_at(in, in.offset_of(position_from(member(params, "position")), now.client.units));
+}
+
+json location_of(const session &now, document &in, const stretch &part) {
+    return {{"uri", in.uri()}, {"range", to_json(in.positions(now.client.units).of(part))}};
+}
+
+json workspace_edit(const session &now, const document &of, json edits) {
+    if (!now.client.versioned_edits)
+        return {{"changes", {{of.uri(), std::move(edits)}}}};
+    json document = {{"uri", of.uri()}, {"version", of.version()}};
+    return {{"documentChanges", json::array({{{"textDocument", std::move(document)}, {"edits", std::move(edits)}}})}};
+}
+
+json text_edit(position_maker &positions, const stretch &part, std::string_view by) {
+    return {{"range", to_json(positions.of(part))}, {"newText", by}};
+}
+
+} // namespace lsp

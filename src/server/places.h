@@ -1,0 +1,40 @@
+/* places.h: what is at the place in a document that a request names. */
+#ifndef CDGEN_SERVER_PLACES_H
+#define CDGEN_SERVER_PLACES_H
+
+#include "server/session.h"
+
+namespace lsp {
+
+struct place_in_source {
+    document &in;
+    std::size_t offset;
+    std::size_t line;                         /* in index::lines; 0 in an empty source */
+    const source_index::stanza *stanza;       /* null: before the first header */
+    const source_index::attribute *attribute; /* null: the line has none */
+    bool in_comment;                          /* after the line's text, where a comment begins */
+
+    /* Whether the attribute is one that the stanza's kind has. */
+    bool has_known_attribute() const {
+        return attribute != nullptr && attribute->known != nullptr;
+    }
+    const std::string &text() const {
+        return in.text();
+    }
+};
+
+place_in_source place_at(document &in, std::size_t offset);
+
+/* The place that the parameters of a request name: a document and a position. */
+place_in_source place_in(session &now, const json &params);
+
+/* A location, or a list of several. */
+json location_of(const session &now, document &in, const stretch &part);
+
+/* A workspace edit of one document, whose edits are these. */
+json workspace_edit(const session &now, const document &of, json edits);
+json text_edit(position_maker &positions, const stretch &part, std::string_view by);
+
+} // namespace lsp
+
+#endif

@@ -1,0 +1,135 @@
+/* rename.cpp: gives something another name, everywhere. */
+
+#include "server/rename.h"
+
+#include "index/expressions.h"
+#include "language/suggestions.h"
+#include "server/places.h"
+
+#include <algorithm>
+#include <map>
+
+namespace lsp {
+
+namespace {
+
+using source_index::mention;
+using source_index::named;
+using source_index::names;
+
+/* The mention at a place if its name can be changed: a class's own name is for other programs. */
+const mention *renamable_at(const place_in_source &place) {
+    const mention *here = place.in.names().at(place.offset);
+    if (here == nullptr || place.in.names().all[here->name].kind == source_index::name_kind::resource_class)
+        return nullptr;
+    return here;
+}
+
+struct replacement {
+    stretch at;
+    std::string text;
+};
+
+/* Whether a whole value is the name, as opposed to a word of an expression. */
+bool is_whole_value(document &in, const mention &each) {
+    const source_index::attribute *line = in.index().attribute_at(in.index().line_at(each.at.begin));
+    return line != nullptr && line->parts.value == each.at;
+}
+
+/* Whether a line with this text after the equals sign has the name as its value. */
+bool reads_as(std::string_view written, std::string_view name) {
+    std::string line = "\ta=" + std::string(written);
+    std::vector<source_index::line> read = source_index::lines_of(line);
+    return read.size() == 1 && source_index::parts_of(line, read[0].text).value.of(line) == name;
+}
+
+/* How the name is written in the place of a mention, with quotes if it needs them. */
+replacement written_at(document &in, const mention &each, std::string_view name) {
+    const source_index::attribute *line = in.index().attribute_at(in.index().line_at(each.at.begin));
+    if (!is_whole_value(in, each) || line->parts.quoted || reads_as(name, name))
+        return {each.at, std::string(name)};
+    return {each.at, "\"" + std::string(name) + "\""};
+}
+
+std::string replaced(const std::string &text, const std::vector<replacement> &all) {
+    std::string made;
+    std::size_t done = 0;
+    for (const replacement &each : all) {
+        made.append(text, done, each.at.begin - done).append(each.text);
+        done = each.at.end;
+    }
+    return made.append(text, done);
+}
+
+/* Whether two sources use their names in the same way: which mentions have one name did not change. */
+bool have_same_structure(const names &before, const names &after) {
+    std::map<std::size_t, std::size_t> partner;
+    std::map<std::size_t, std::size_t> taken;
+    bool same = before.mentions.size() == after.mentions.size();
+    for (std::size_t i = 0; same && i < before.mentions.size(); ++i) {
+        const mention &a = before.mentions[i];
+        const mention &b = after.mentions[i];
+        same = a.defines == b.defines && a.stanza == b.stanza &&
+               partner.try_emplace(a.name, b.name).first->second == b.name &&
+               taken.try_emplace(b.name, a.name).first->second == a.name;
+    }
+    return same;
+}
+
+/* The first finding of which there are more than before; null: there is none. */
+const check::finding *new_finding(const std::vector<check::finding> &before, const std::vector<check::finding> &after) {
+    std::map<std::string_view, int> known;
+    for (const check::finding &each : before)
+        ++known[each.code];
+    for (const check::finding &each : after)
+        if (--known[each.code] < 0)
+            return &each;
+    return nullptr;
+}
+
+void require_writable(const place_in_source &place, const named &old, const std::string &name) {
+    if (name.empty() || name.find_first_of(std::string_view("\n\r\0", 3)) != std::string::npos)
+        throw request_error(REQUEST_FAILED, "this is no name");
+    if (!reads_as("\"" + name + "\"", name))
+        throw request_error(REQUEST_FAILED, "a source cannot have " + language::quoted(name) + " as a name");
+    if (old.in_expressions && !source_index::is_expression_name(name))
+        throw request_error(REQUEST_FAILED, "an expression uses the name, and cannot have " + language::quoted(name));
+    for (const named &each : place.in.names().all)
+        if (each.kind == old.kind && each.scope == old.scope && each.text == name && name != old.text)
+            throw request_error(REQUEST_FAILED, "there is " + language::quoted(name) + " already");
+}
+
+} // namespace
+
+json prepare_rename(session &now, const json &params) {
+    place_in_source place = place_in(now, params);
+    const mention *here = renamable_at(place);
+    if (here == nullptr)
+        return nullptr;
+    return {{"range", to_json(place.in.positions(now.client.units).of(here->at))},
+            {"placeholder", place.in.names().all[here->name].text}};
+}
+
+json rename(session &now, const json &params) {
+    place_in_source place = place_in(now, params);
+    std::string name = text_member(params, "newName");
+    const mention *here = renamable_at(place);
+    if (here == nullptr)
+        throw request_error(REQUEST_FAILED, "there is no name here that can be changed");
+    require_writable(place, place.in.names().all[here->name], name);
+    std::vector<replacement> all;
+    for (const mention &each : place.in.names().of(here->name))
+        all.push_back(written_at(place.in, each, name));
+    document after(place.in.uri(), 0, replaced(place.text(), all));
+    if (!have_same_structure(place.in.names(), after.names()))
+        throw request_error(REQUEST_FAILED, "something else would have the name " + language::quoted(name));
+    if (const check::finding *wrong = new_finding(place.in.findings(now.wanted), after.findings(now.wanted)))
+        throw request_error(REQUEST_FAILED, std::string(wrong->code) + ": " + wrong->text);
+    json edits = json::array();
+    position_maker positions = place.in.positions(now.client.units);
+    for (const replacement &each : all)
+        edits.push_back(text_edit(positions, each.at, each.text));
+    return workspace_edit(now, place.in, std::move(edits));
+}
+
+} // namespace lsp

@@ -1,0 +1,545 @@
+"""Test what `cdef lsp` offers at a place of a class."""
+
+import re
+import subprocess
+
+import pytest
+
+from compare import same
+from lsp_client import CAPABILITIES, Client, ServerError, edited, edits_in, offset, part, position
+from programs import PROGRAMS
+
+URI = "file:///classes/Pump.cdefsrc"
+PUMP = """# A pump.
+ControlDefinition
+\tFileVersion=1.0.0.0
+ResourceClass
+\tDescription=1
+\tDisplayName=2
+\tProperties=HasResources,CanDefine
+\tClassPermTemplate=0
+\tResourcePermTemplate=0
+\tName=Pump
+\tLocator=Host
+ResourceVariableClass
+\tVariableClass=Flow
+\tObservationInterval=10
+\tReportingInterval=60
+PersistentResourceAttribute
+\tName=Host
+\tDescription=3
+\tDisplayName=4
+\tId=4
+\tDataType=String
+\tVarietyRange=1,1
+\tProperties=Public,ReqdForDefine
+DynamicResourceAttribute
+\tName=Speed
+\tDescription=5
+\tDisplayName=6
+\tId=7
+\tDataType=SD
+\tVarietyRange=1,1
+\tVariableType=State
+\tVariableClass=Flow
+\tExpression="Speed.Turns > 9 && Speed.Turns < 99"
+\tReArmExpression="Host == 'Host'"
+DAttrSDDefinition
+\tElementName=Turns
+\tDescription=7
+\tDisplayName=8
+\tElementIndex=0
+\tDataType=UInt32
+ResourceAction
+\tName=Stop
+\tDescription=9
+\tDisplayName=10
+\tId=0
+\tVarietyRange=1,1
+ActionInSDDefinition
+\tElementName=When
+\tDescription=11
+\tDisplayName=12
+\tElementIndex=0
+\tDataType=UInt32
+ClassToManagerMapping
+\tResourceManager=M
+\tFirstKey=1
+\tLastKey=2
+\tMessageCatalog=m.cat
+\tDescriptiveMessageSet=1
+"""
+
+
+@pytest.fixture(name="pump")
+def opened():
+    """A client with the class."""
+    with Client() as client:
+        client.open(URI, PUMP)
+        assert client.diagnostics(URI) == []
+        client.version = 1
+        yield client
+
+
+def show(client, text):
+    """Replace the document."""
+    client.version += 1
+    client.change(URI, client.version, text)
+    client.diagnostics(URI, client.version)
+
+
+def marked(text):
+    """The text without its mark |, and the mark's position."""
+    at = text.index("|")
+    text = text.replace("|", "", 1)
+    return text, position(text, at)
+
+
+def place(text, words):
+    """The position of the mark | in words of the text."""
+    at = text.index(words.replace("|", "")) + words.index("|")
+    return position(text, at)
+
+
+def at(client, method, where, **params):
+    return client.about(method, URI, position=where, **params)
+
+
+def labels(items):
+    return [each["label"] for each in items]
+
+
+# ---- Hover -----------------------------------------------------------------------------------------------------------
+
+
+def hover(client, words, text=PUMP):
+    found = at(client, "textDocument/hover", place(text, words))
+    return found and (found["contents"]["value"], part(text, found["range"]))
+
+
+def test_hover_shows_an_attribute(pump):
+    image = compiled(PUMP)
+    text, name = hover(pump, "\tI|d=7")
+    assert name == "Id"
+    head, *points = text.splitlines()
+    assert head == "`Id` of `DynamicResourceAttribute`: attribute number, see Numbers and who checks them"
+    (database,) = [line for line in points if line.startswith("- in the database")]
+    said = re.fullmatch(r"- in the database: `ra_attr_id` at offset 0x([0-9a-f]+), bytes `07 00 00 00`", database)
+    begin = int(said.group(1), 16)
+    assert image[begin:begin + 4] == b"\7\0\0\0"
+    same([line for line in points if line and line != database], [
+        "- given: required, once",
+        "- value: number32: an integer, of which the low 32 bits are kept",
+        "- range: 0 to 2147483647",
+        "- field: `ra_attr_id` of `rsrc_dattr_t`, 4 bytes from offset 120",
+    ], "points")
+
+
+def compiled(text):
+    """The database that the compiler makes."""
+    import pathlib
+    import tempfile
+    with tempfile.TemporaryDirectory() as directory:
+        source, output = pathlib.Path(directory, "Pump.cdefsrc"), pathlib.Path(directory, "Pump.cdef")
+        source.write_text(text)
+        subprocess.run([PROGRAMS.cdgen, source, output], check=True, capture_output=True)
+        return output.read_bytes()
+
+
+@pytest.mark.parametrize("words, number", [
+    ("\tDescripti|on=1", 1), ("\tDescripti|on=3", 3), ("\tDescripti|on=5", 5), ("\tDescripti|on=7", 7),
+    ("\tDescripti|on=9", 9), ("\tDescripti|on=11", 11), ("\tLastK|ey=2", 2), ("\tReportingInt|erval=60", 60),
+])
+def test_hover_shows_the_bytes_of_every_kind_of_record(pump, words, number):
+    text, _ = hover(pump, words)
+    begin, shown = re.search(r"at offset 0x([0-9a-f]+), bytes `([0-9a-f ]+)`", text).groups()
+    raw = number.to_bytes(2, PROGRAMS.native)
+    assert bytes.fromhex(shown) == raw
+    assert compiled(PUMP)[int(begin, 16):int(begin, 16) + 2] == raw
+
+
+def test_hover_without_a_database_has_no_bytes(pump):
+    show(pump, PUMP.replace("FirstKey", "FirstKy"))
+    text, _ = hover(pump, "\tI|d=7", PUMP.replace("FirstKey", "FirstKy"))
+    assert "field: `ra_attr_id`" in text and "in the database" not in text
+
+
+def test_hover_shows_values(pump):
+    assert hover(pump, "DataType=Str|ing")[0].startswith("data type `String`\n\n- text of a value: any text, not empty")
+    assert hover(pump, "VariableType=St|ate")[0].startswith("variable type `State`: One of several values")
+    text, name = hover(pump, "Public,Reqd|ForDefine")
+    assert name == "ReqdForDefine" and text.startswith("property `ReqdForDefine`\n\n- bit: 0x2\n- meaning: A client")
+    assert hover(pump, "=Pub|lic,Reqd")[1] == "Public"
+
+
+def test_hover_shows_names_where_they_are_used(pump):
+    text, name = hover(pump, "Locator=H|ost")
+    assert name == "Host" and text.startswith("`Host`: `PersistentResourceAttribute`, Id 4, DataType String\n")
+    text, name = hover(pump, "> 9 && Speed.Tu|rns")
+    assert name == "Turns" and text.startswith("`Turns`: `DAttrSDDefinition`, ElementIndex 0, DataType UInt32\n")
+
+
+def test_hover_shows_a_stanza(pump):
+    text, name = hover(pump, "Resource|Action")
+    assert name == "ResourceAction" and text.startswith("`ResourceAction`: what a resource can be told to do\n")
+    assert "- required: `Name`, `Description`, `DisplayName`, `Id` and `VarietyRange`" in text
+
+
+def test_hover_is_silent_in_comments_and_unknown_lines(pump):
+    assert hover(pump, "# A p|ump") is None
+    show(pump, "Nonsense\n\tName=a\n")
+    assert hover(pump, "Non|sense", "Nonsense\n\tName=a\n") is None
+    assert hover(pump, "Na|me", "Nonsense\n\tName=a\n") is None
+
+
+# ---- Completion ------------------------------------------------------------------------------------------------------
+
+
+def complete(client, text):
+    """The items at the mark, and what the text becomes with the one of a label."""
+    text, where = marked(text)
+    show(client, text)
+    items = at(client, "textDocument/completion", where)
+
+    def taken(label):
+        (item,) = [each for each in items if each["label"] == label]
+        return edited(text, [item["textEdit"]])
+
+    return items, taken
+
+
+CLASS = PUMP[:PUMP.index("ResourceVariableClass")]
+
+
+def test_first_stanza(pump):
+    items, taken = complete(pump, "|")
+    assert labels(items) == ["ControlDefinition", "ClassToManagerMapping", "ResourceVariableClass"]
+    assert taken("ControlDefinition") == "ControlDefinition\n\tFileVersion=${1:1.0.0.0}$0"
+
+
+def test_stanza_brings_its_required_lines_in_order(pump):
+    items, taken = complete(pump, PUMP + "Resou|")
+    assert taken("ResourceAction")[len(PUMP):] == (
+        "ResourceAction\n\tName=${1:NewName}\n\tDescription=${2:0}\n\tDisplayName=${3:0}\n\tId=${4:1}\n"
+        "\tVarietyRange=${5:1,1}$0")
+    assert all(each["documentation"]["kind"] == "markdown" for each in items)
+    assert "ClassToManagerMapping" not in labels(items) and "ControlDefinition" not in labels(items)
+
+
+def test_stanza_of_a_client_without_snippets_compiles(directory):
+    with Client(capabilities={}) as client:
+        client.version = 1
+        client.open(URI, PUMP)
+        head = PUMP[:PUMP.index("ClassToManagerMapping")]
+        for label in ("PersistentResourceAttribute", "DynamicClassAttribute", "ClassAction", "OnlineSDDefinition",
+                      "ResourceVariableClass", "ActionInSDDefinition", "ActionOutSDDefinition"):
+            _, taken = complete(client, head + "|\n" + PUMP[len(head):])
+            source = directory / "class.cdefsrc"
+            source.write_text(taken(label))
+            subprocess.run([PROGRAMS.cdgen, source, directory / "class.cdef"], check=True)
+
+
+def test_elements_only_where_they_belong(pump):
+    items, _ = complete(pump, CLASS + "|")
+    assert "PAttrSDDefinition" not in labels(items) and "ActionInSDDefinition" not in labels(items)
+    assert "OnlineSDDefinition" in labels(items)
+    until = PUMP.index("ResourceAction")
+    assert "DAttrSDDefinition" in labels(complete(pump, PUMP[:until] + "|\n" + PUMP[until:])[0])
+    assert "ActionOutSDDefinition" in labels(complete(pump, PUMP[:PUMP.index("ClassToM")] + "|")[0])
+
+
+def test_missing_attributes_come_before_optional_ones(pump):
+    text = CLASS + "PersistentResourceAttribute\n\tName=A\n\tDescription=1\n\tDisplayName=1\n"
+    items, taken = complete(pump, text + "\tI|")
+    assert labels(items) == ["Id", "DataType", "VarietyRange"]
+    assert taken("Id") == text + "\tId=0"
+    assert "- field: `ra_attr_id`" in items[0]["documentation"]["value"]
+    complete_stanza = text + "\tId=0\n\tDataType=Int32\n\tVarietyRange=1,1\n"
+    items, _ = complete(pump, complete_stanza + "\tGroupID=1\n\t|")
+    assert labels(items) == ["VarietyRange", "GroupName", "Properties", "ValidValue", "ValueDisplayName",
+                             "DefaultValue", "ListActionRsrc", "ListActionClass"]
+
+
+def test_optional_attributes_are_not_offered_above_required_ones(pump):
+    items, _ = complete(pump, CLASS + "ResourceAction\n\tName=A\n\t|\n\tDescription=1\n\tDisplayName=1\n\tId=0\n")
+    assert labels(items) == ["VarietyRange"]
+
+
+def test_name_before_an_equals_sign_keeps_it(pump):
+    text = CLASS + "ResourceAction\n\tN|=A\n"
+    _, taken = complete(pump, text)
+    assert taken("Name").endswith("\tName=A\n")
+
+
+@pytest.mark.parametrize("line, expected", [
+    ("\tVariableType=|", ["Counter", "Quantity", "State", "Quantum"]),
+    ("\tVariableClass=F|", ["Flow"]),
+    ("\tProperties=Public,|", ["QryReqsMonitoring"]),
+    ("\tId=|", ["8"]),
+    ("\tExpression=\"Speed.|", ["Turns"]),
+    ("\tExpression=\"Sp|", ["Speed", "Host"]),
+    ("\tName=|", []),
+    ("\t# |", []),
+])
+def test_values(pump, line, expected):
+    until = PUMP.index("ClassToManagerMapping")
+    items, _ = complete(pump, PUMP[:until] + "DynamicResourceAttribute\n" + line + "\n" + PUMP[until:])
+    assert labels(items) == expected
+
+
+def test_types_are_those_of_the_stanza(pump):
+    items, taken = complete(pump, CLASS + "PersistentResourceAttribute\n\tDataType=In|")
+    assert "SDArray" in labels(items) and "SBS" not in labels(items)
+    assert items[0]["documentation"]["value"].startswith("data type")
+    assert taken("Int32").endswith("\tDataType=Int32")
+    items, _ = complete(pump, CLASS + "OnlineSDDefinition\n\tDataType=|")
+    assert "SDArray" not in labels(items)
+
+
+def test_locators_are_attributes(pump):
+    text = PUMP.replace("Locator=Host", "Locator=|")
+    assert labels(complete(pump, text)[0]) == ["Host"]
+
+
+def test_valid_values_are_defaults(pump):
+    items, _ = complete(pump, CLASS + "PersistentResourceAttribute\n\tValidValue=a\n\tValidValue=b\n\tDefaultValue=|")
+    assert labels(items) == ["a", "b"]
+
+
+# ---- Names -----------------------------------------------------------------------------------------------------------
+
+
+def lines(places):
+    return [each["range"]["start"]["line"] + 1 for each in places]
+
+
+def line_of(words, text=PUMP):
+    return text[:text.index(words)].count("\n") + 1
+
+
+def test_definitions(pump):
+    for words, definition in (("Locator=H|ost", "Name=Host"), ("VariableClass=Fl|ow\n\tEx", "VariableClass=Flow"),
+                              ("99 && Speed.", None), ("> 9 && Sp|eed", "Name=Speed"), ("\"|Host ==", "Name=Host"),
+                              ("> 9 && Speed.T|urns", "ElementName=Turns")):
+        if definition:
+            found = at(pump, "textDocument/definition", place(PUMP, words))
+            assert lines(found) == [line_of(definition)], words
+
+
+def test_references(pump):
+    where = place(PUMP, "Name=Ho|st")
+    uses = at(pump, "textDocument/references", where, context={"includeDeclaration": False})
+    assert lines(uses) == [line_of("Locator="), line_of("ReArmExpression=")]
+    assert {part(PUMP, each["range"]) for each in uses} == {"Host"}
+    everywhere = at(pump, "textDocument/references", where, context={"includeDeclaration": True})
+    assert len(everywhere) == 3
+
+
+def test_highlights(pump):
+    found = at(pump, "textDocument/documentHighlight", place(PUMP, "ElementName=Tur|ns"))
+    assert [(each["kind"], part(PUMP, each["range"])) for each in found] == [(2, "Turns"), (2, "Turns"), (3, "Turns")]
+
+
+def test_places_without_a_name(pump):
+    where = place(PUMP, "Descripti|on=1")
+    assert at(pump, "textDocument/definition", where) == []
+    assert at(pump, "textDocument/prepareRename", where) is None
+    with pytest.raises(ServerError):
+        at(pump, "textDocument/rename", where, newName="a")
+
+
+def rename(client, words, name, text=PUMP):
+    change = edits_in(at(client, "textDocument/rename", place(text, words), newName=name))
+    return edited(text, change[URI])
+
+
+@pytest.mark.parametrize("words, old, new, count", [
+    ("Name=Ho|st", "Host", "Node", 3), ("Locator=H|ost", "Host", "\u039a\u03cc\u03bc\u03b2\u03bf\u03c2", 3),
+    ("Speed.Tu|rns >", "Turns", "Rounds", 3), ("VariableClass=Fl|ow", "Flow", "Water flow", 2),
+    ("Name=St|op", "Stop", "Halt #1", 1), ("Name=Spe|ed", "Speed", "Tempo", 3), ("Name=Whe|n", "When", "At", 1),
+])
+def test_rename_changes_nothing_else(pump, directory, words, old, new, count):
+    """`check` stays clean, and `diff` shows the new name."""
+    prepared = at(pump, "textDocument/prepareRename", place(PUMP, words))
+    assert (prepared["placeholder"], part(PUMP, prepared["range"])) == (old, old)
+    after = rename(pump, words, new)
+    assert after.count(new) == PUMP.count(new) + count
+    show(pump, after)
+    assert pump.published[URI]["diagnostics"] == []
+    for name, text in (("a", PUMP), ("b", after)):
+        (directory / f"{name}.cdefsrc").write_text(text)
+        subprocess.run([PROGRAMS.cdgen, directory / f"{name}.cdefsrc", directory / f"{name}.cdef"], check=True)
+    shown = subprocess.run([PROGRAMS.cdef, "diff", directory / "a.cdef", directory / "b.cdef"], capture_output=True,
+                           check=False)
+    changed = shown.stdout.decode().splitlines()
+    assert changed and all(old in line or new in line for line in changed if not line.startswith("~")), changed
+
+
+@pytest.mark.parametrize("words, new, why", [
+    ("Name=Ho|st", "Speed", "S"), ("Name=Ho|st", "a b", "an expression uses the name"),
+    ("Name=Ho|st", "", "no name"), ("Name=St|op", "a\nb", "no name"), ("Name=Ho|st", "Speed ", "expression"),
+    ("Name=St|op", "a\\", "cannot have"), ("Name=St|op", " a", "S"),
+])
+def test_rename_that_would_harm_is_refused(pump, words, new, why):
+    with pytest.raises(ServerError) as refused:
+        rename(pump, words, new)
+    assert refused.value.code == -32803
+    assert why in str(refused.value)
+
+
+def test_name_of_a_class_is_for_others(pump):
+    assert at(pump, "textDocument/prepareRename", place(PUMP, "Name=Pu|mp")) is None
+
+
+# ---- Outline, folding, tokens ----------------------------------------------------------------------------------------
+
+
+def tree(symbols):
+    return [(each["name"], each["detail"], tree(each.get("children", []))) for each in symbols]
+
+
+def test_outline(pump):
+    symbols = pump.about("textDocument/documentSymbol", URI)
+    same(tree(symbols), [
+        ("ControlDefinition", "ControlDefinition", []), ("Pump", "ResourceClass", []),
+        ("Flow", "ResourceVariableClass", []), ("Host", "PersistentResourceAttribute", []),
+        ("Speed", "DynamicResourceAttribute", [("Turns", "DAttrSDDefinition", [])]),
+        ("Stop", "ResourceAction", [("When", "ActionInSDDefinition", [])]), ("M", "ClassToManagerMapping", []),
+    ], "outline")
+    speed = symbols[4]
+    assert part(PUMP, speed["selectionRange"]) == "Speed"
+    assert part(PUMP, speed["range"]).startswith("DynamicResourceAttribute\n")
+    assert part(PUMP, speed["range"]).endswith("\tElementIndex=0\n\tDataType=UInt32")
+
+
+def test_outline_of_a_client_without_trees():
+    with Client(capabilities={}) as client:
+        client.open(URI, PUMP)
+        names = [(each["name"], each.get("containerName")) for each in client.about("textDocument/documentSymbol", URI)]
+    assert ("Turns", "Speed") in names and ("Speed", None) in names
+
+
+def test_folding(pump):
+    text = "# a\n# b\n\nResourceClass\n\tName=A\n\n\tLocator=B\n\n# c\nResourceAction\n"
+    show(pump, text)
+    found = {(each["startLine"], each["endLine"], each["kind"])
+             for each in pump.about("textDocument/foldingRange", URI)}
+    assert found == {(0, 1, "comment"), (3, 6, "region")}
+
+
+def tokens(client, text, method="textDocument/semanticTokens/full", **params):
+    """(text, type, modifiers) of each token."""
+    legend = client.offers["semanticTokensProvider"]["legend"]
+    data, found, line, character = client.about(method, URI, **params)["data"], [], 0, 0
+    for down, right, length, kind, modifiers in zip(*[iter(data)] * 5):
+        line, character = line + down, (0 if down else character) + right
+        begin = offset(text, {"line": line, "character": character})
+        end = offset(text, {"line": line, "character": character + length})
+        found.append((text[begin:end], legend["tokenTypes"][kind], modifiers))
+    return found
+
+
+def test_tokens(pump):
+    text = ("ResourceClass # \U0001d50a\n\tProperties=CanDefine\nDynamicResourceAttribute\n\tName=Sp\u00e4\n"
+            "\tId=7 // x\n\tDataType=Int32\n\tNonsense=1\n\tExpression=\"Sp\u00e4 > 1\"\n")
+    show(pump, text)
+    expected = [
+        ("ResourceClass", "class", 0), ("# \U0001d50a", "comment", 0), ("Properties", "property", 0),
+        ("CanDefine", "enumMember", 0), ("DynamicResourceAttribute", "class", 0), ("Name", "property", 0),
+        ("Sp\u00e4", "variable", 1), ("Id", "property", 0), ("7", "number", 0), ("// x", "comment", 0),
+        ("DataType", "property", 0), ("Int32", "type", 0), ("1", "string", 0), ("Expression", "property", 0),
+        ("Sp\u00e4", "variable", 0),
+    ]
+    same(tokens(pump, text), expected, "tokens")
+    second = {"start": {"line": 1, "character": 3}, "end": {"line": 1, "character": 4}}
+    assert tokens(pump, text, "textDocument/semanticTokens/range", range=second) == expected[2:4]
+
+
+# ---- Actions ---------------------------------------------------------------------------------------------------------
+
+
+def actions(client, words, text, **context):
+    """title -> the text afterwards."""
+    where = place(text, words)
+    found = client.about("textDocument/codeAction", URI, range={"start": where, "end": where},
+                         context={"diagnostics": [], **context})
+    return {each["title"]: edited(text, edits_in(each["edit"])[URI]) for each in found}, found
+
+
+def test_corrections_of_findings(pump):
+    text = PUMP.replace("FirstKey", "FirstKy")
+    show(pump, text)
+    made, (action, *_) = actions(pump, "First|Ky", text, only=["quickfix"])
+    assert made["Replace `FirstKy` with `FirstKey`"] == PUMP
+    assert action["isPreferred"] and [each["code"] for each in action["diagnostics"]] == ["S106"]
+    assert action["edit"]["documentChanges"][0]["textDocument"] == {"uri": URI, "version": pump.version}
+
+
+def test_correction_of_carriage_returns_is_one_that_the_protocol_can_say(pump):
+    text = PUMP.replace("\n", "\r\n")
+    show(pump, text)
+    everything = {"start": {"line": 0, "character": 0}, "end": position(text, len(text))}
+    found = pump.about("textDocument/codeAction", URI, range=everything, context={"diagnostics": []})
+    assert PUMP in [edited(text, edits_in(each["edit"])[URI]) for each in found]
+
+
+def test_all_that_is_certain(pump):
+    text = PUMP.replace("FirstKey", "FirstKy").replace("LastKey", "LastKy")
+    show(pump, text)
+    made, _ = actions(pump, "# A| pump", text, only=["source.fixAll"])
+    assert made == {"Correct all that is certain": PUMP}
+
+
+def test_missing_lines_are_added_where_they_may_be(pump):
+    text = PUMP.replace("\tDescription=9\n", "").replace("\tId=0\n", "").replace("VarietyRange=1,1\nActionIn",
+                                                                                "VarietyRange=1,1\n\tTimeOut=5\nActionIn")
+    show(pump, text)
+    made, _ = actions(pump, "Resource|Action", text, only=["quickfix"])
+    after = made["Add `Description` and `Id`"]
+    assert "\tVarietyRange=1,1\n\tDescription=0\n\tId=0\n\tTimeOut=5\n" in after
+    show(pump, after)
+    assert pump.published[URI]["diagnostics"] == []
+
+
+def test_next_free_number(pump):
+    text = PUMP.replace("Id=7", "Id=4")
+    show(pump, text)
+    where = "\tId=|4\n\tDataType=SD"
+    made, _ = actions(pump, where, text, only=["quickfix"])
+    assert made["Use the next free number, 5"] == PUMP.replace("Id=7", "Id=5")
+
+
+def test_quotes(pump):
+    made, _ = actions(pump, "\tName=Ho|st", PUMP, only=["refactor"])
+    assert made["Put the value in quotes"] == PUMP.replace("Name=Host", 'Name="Host"')
+    text = PUMP.replace("Name=Host", "Name=Ho\\")
+    show(pump, text)
+    assert actions(pump, "\tName=H|o", text, only=["refactor"])[0] == {}
+
+
+def test_client_without_literal_actions_gets_none():
+    with Client(capabilities={}) as client:
+        client.open(URI, PUMP.replace("FirstKey", "FirstKy"))
+        assert client.about("textDocument/codeAction", URI, context={"diagnostics": []}, range={
+            "start": {"line": 0, "character": 0}, "end": {"line": 99, "character": 0}}) == []
+
+
+def test_every_edit_of_every_finding_is_offered(pump):
+    """Those of `cdef check --format json`."""
+    text = (PUMP.replace("FirstKey", "FirstKy").replace("=String", "=Strin").replace("\tName=Stop", "    \tName =Stop")
+            .replace("LastKey=2", "LastKey=2\r"))
+    show(pump, text)
+    found = pump.about("textDocument/codeAction", URI, context={"diagnostics": [], "only": ["quickfix"]}, range={
+        "start": {"line": 0, "character": 0}, "end": {"line": 999, "character": 0}})
+    assert sorted(each["diagnostics"][0]["code"] for each in found if "diagnostics" in each)
+    assert len([each for each in found if "diagnostics" in each]) >= 3
+
+
+def test_utf_8_edits():
+    capabilities = {**CAPABILITIES, "general": {"positionEncodings": ["utf-8"]}}
+    text = PUMP.replace("Name=Host", "Name=\u03b1\U0001d50a").replace("Locator=Host", "Locator=\u03b1\U0001d50a")
+    with Client(capabilities=capabilities) as client:
+        client.open(URI, text)
+        where = position(text, text.index("\u03b1"), "utf-8")
+        change = at(client, "textDocument/rename", where, newName="Node")
+        assert edited(text, edits_in(change)[URI], "utf-8") == PUMP.replace("=Host", "=Node")

@@ -6,8 +6,7 @@
 #include "cdef/support/forms.h"
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
-#include "compare/compare.h"
-#include "compare/writer.h"
+#include "compare/describe.h"
 
 #include <CLI/CLI.hpp>
 
@@ -68,10 +67,6 @@ private:
 
 /* ---- Forms ----------------------------------------------------------------------------------------------------- */
 
-char sign_of(change what) {
-    return what == change::REMOVED ? '-' : what == change::ADDED ? '+' : '~';
-}
-
 /* Rules that a difference breaks, as far as somebody asked for them. */
 diff::reasons rules_broken(const difference &d, compare::level up_to) {
     diff::reasons rules;
@@ -94,41 +89,13 @@ public:
     void end() {}
 
     void add(const difference &d, const diff::reasons &why) {
-        out.take(std::string{sign_of(d.what), ' '});
-        write_path(d);
-        if (d.what == change::RENAMED) {
-            writer.write(": renamed to ");
-            writer.write_name(*d.renamed_to);
-        }
-        if (d.what == change::CHANGED)
-            write_change(d);
+        compare::describe(d, one_class, writer);
         for (const compare::breach_rule *rule : why)
             out.take(std::string(rule == why.front() ? " (" : "; ").append(rule->reason));
         out.take(why.empty() ? "\n" : ")\n");
     }
 
 private:
-    /* Neither the database nor, if there is just one, the class. */
-    void write_path(const difference &d) {
-        bool in_only_class = d.path.size() > 2 && one_class && d.path[1]->kind == node_kind::resource_class;
-        std::size_t first = d.path.size() == 1 ? 0 : in_only_class ? 2 : 1;
-        for (std::size_t i = first; i < d.path.size(); ++i) {
-            out.take(i == first ? "" : ", ");
-            out.take(d.path[i]->label());
-            out.take(has_name(*d.path[i]) ? " " : "");
-            writer.write_name(*d.path[i]);
-        }
-    }
-
-    void write_change(const difference &d) {
-        out.take(": ");
-        out.take(d.before->what->label());
-        out.take(" ");
-        writer.write_fact(*d.before);
-        out.take(" -> ");
-        writer.write_fact(*d.after);
-    }
-
     held_output &out;
     compare::writer writer;
     bool one_class;
@@ -143,12 +110,6 @@ struct compared {
     compare::origin origin() const {
         return {in.db, owners};
     }
-    bool has_one_class() const {
-        auto classes = in.db.classes();
-        auto first = classes.begin();
-        return first != classes.end() && ++first == classes.end();
-    }
-
     input in;
     cdb::ownership owners;
 };
@@ -213,7 +174,8 @@ outcome write_to(held_output &out, const compared &before, const compared &after
         diff::document form([&out](std::string_view piece) { out.take(piece); }, size);
         return write_differences(before, after, options, form);
     }
-    lines form(out, size, before.has_one_class() && after.has_one_class());
+    bool one_class = compare::has_one_class(before.in.db) && compare::has_one_class(after.in.db);
+    lines form(out, size, one_class);
     return write_differences(before, after, options, form);
 }
 

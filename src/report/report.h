@@ -4,10 +4,12 @@
 
 #include "check/check.h"
 #include "report/json_writer.h"
+#include "report/rules.h"
 
 #include <cstddef>
 #include <memory>
 #include <string>
+#include <vector>
 
 namespace report {
 
@@ -32,6 +34,8 @@ public:
 /* Each writes a document for all sources. */
 std::unique_ptr<writer> json_form(output to);
 std::unique_ptr<writer> sarif_form(output to);
+/* more: the rules that findings may break besides those of all_rules(). */
+std::unique_ptr<writer> sarif_form(output to, std::vector<rule> more);
 /* The code quality report of GitLab. */
 std::unique_ptr<writer> gitlab_form(output to);
 

@@ -11,10 +11,6 @@ namespace report {
 
 namespace {
 
-std::string help_of(std::string_view cause, std::string_view cure) {
-    return std::string(cause).append(cure.empty() ? "" : " ").append(cure);
-}
-
 std::vector<rule> make_rules() {
     std::vector<rule> all;
     for (const message &known : message_rows)
@@ -25,6 +21,10 @@ std::vector<rule> make_rules() {
 }
 
 } // namespace
+
+std::string help_of(std::string_view cause, std::string_view cure) {
+    return std::string(cause).append(cure.empty() ? "" : " ").append(cure);
+}
 
 const std::vector<rule> &all_rules() {
     static const std::vector<rule> all = make_rules();

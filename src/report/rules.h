@@ -21,8 +21,11 @@ struct rule {
 /* The errors, then the warnings. */
 const std::vector<rule> &all_rules();
 
-/* The position of a code in all_rules(). */
+/* The position of a code in all_rules(); their number for one that is not among them. */
 std::size_t rule_index(std::string_view code);
+
+/* What help says of a cause and a cure. */
+std::string help_of(std::string_view cause, std::string_view cure);
 
 } // namespace report
 

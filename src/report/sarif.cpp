@@ -86,10 +86,10 @@ json related_locations(const std::string &file, const finding &found) {
     return all;
 }
 
-json result_of(const std::string &file, const finding &found, const fingerprint &print) {
+json result_of(const std::string &file, const finding &found, const fingerprint &print, std::size_t rule) {
     json entry;
     entry["ruleId"] = found.code;
-    entry["ruleIndex"] = rule_index(found.code);
+    entry["ruleIndex"] = rule;
     entry["level"] = found.error ? "error" : "warning";
     entry["message"]["text"] = found.text;
     entry["locations"].push_back(location_of(file, found.at, found.source));
@@ -116,7 +116,8 @@ json json_of(const rule &known) {
 
 class sarif_writer : public writer {
 public:
-    explicit sarif_writer(output written_to) : to(std::move(written_to)) {
+    sarif_writer(output written_to, std::vector<rule> more_rules)
+        : to(std::move(written_to)), more(std::move(more_rules)) {
         to.open_object();
         to.add_text("$schema", "https://json.schemastore.org/sarif-2.1.0.json");
         to.add_text("version", "2.1.0");
@@ -132,7 +133,8 @@ public:
         file = name;
     }
     void add(const finding &found) override {
-        to.add_whole([&] { to.add_json({}, json_line(result_of(file, found, made.of(file, found)))); });
+        to.add_whole(
+            [&] { to.add_json({}, json_line(result_of(file, found, made.of(file, found), index_of(found.code)))); });
     }
     void end_source(const check::totals & /* count */) override {}
     void fail_source(const std::string &why) override {
@@ -152,6 +154,12 @@ public:
     }
 
 private:
+    /* Among all rules, those of sources first. */
+    std::size_t index_of(std::string_view code) const {
+        std::size_t index = rule_index(code);
+        auto of_more = std::find_if(more.begin(), more.end(), [code](const rule &each) { return each.code == code; });
+        return index < all_rules().size() ? index : index + static_cast<std::size_t>(of_more - more.begin());
+    }
     void add_driver() {
         to.open_object("driver");
         to.add_text("name", "cdef check");
@@ -159,8 +167,9 @@ private:
         to.add_text("version", CDGEN_VERSION);
         to.add_text("informationUri", "man:cdef(1)");
         to.open_list("rules");
-        for (const rule &known : all_rules())
-            to.add_json({}, json_line(json_of(known)));
+        for (const std::vector<rule> &some : {all_rules(), more})
+            for (const rule &known : some)
+                to.add_json({}, json_line(json_of(known)));
         to.close();
         to.close();
     }
@@ -179,6 +188,7 @@ private:
     }
 
     json_writer to;
+    std::vector<rule> more;
     std::string file;
     fingerprints made;
     std::vector<std::string> unreadable; /* a notification for each such source */
@@ -187,7 +197,11 @@ private:
 } // namespace
 
 std::unique_ptr<writer> sarif_form(output to) {
-    return std::make_unique<sarif_writer>(std::move(to));
+    return sarif_form(std::move(to), {});
+}
+
+std::unique_ptr<writer> sarif_form(output to, std::vector<rule> more) {
+    return std::make_unique<sarif_writer>(std::move(to), std::move(more));
 }
 
 } // namespace report

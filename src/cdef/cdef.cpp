@@ -65,8 +65,8 @@ int run(int argc, char **argv) {
         return "cdef: " + text::escaped(complaint(*program, usage)) + "\nRun 'cdef --help' for more.\n";
     });
     int status = OK;
-    for (auto add :
-         {add_verify, add_dump, add_diff, add_source, add_check, add_format, add_build, add_new, add_explain, add_lsp})
+    for (auto add : {add_verify, add_dump, add_diff, add_source, add_check, add_format, add_build, add_gate, add_new,
+                     add_explain, add_lsp})
         add(app, status);
     unshield_arguments(app);
     try {

@@ -16,6 +16,7 @@ void add_dump(CLI::App &app, int &status);
 void add_build(CLI::App &app, int &status);
 void add_check(CLI::App &app, int &status);
 void add_format(CLI::App &app, int &status);
+void add_gate(CLI::App &app, int &status);
 void add_new(CLI::App &app, int &status);
 void add_explain(CLI::App &app, int &status);
 void add_lsp(CLI::App &app, int &status);

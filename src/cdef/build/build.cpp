@@ -3,12 +3,12 @@
 #include "cdef/build/build.h"
 
 #include "build/dependencies.h"
-#include "cdef/build/sources.h"
 #include "cdef/build/workers.h"
 #include "cdef/cdef.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/output.h"
 #include "cdef/support/replacement.h"
+#include "cdef/support/sources.h"
 #include "cdef/support/status.h"
 
 #include <CLI/CLI.hpp>
@@ -83,7 +83,7 @@ assignment assignment_of(const build_options &options) {
     project_files projects(options.findings.project);
     std::vector<build::request> requests;
     assignment all;
-    for (const std::string &source : build_command::sources_of(options.operands)) {
+    for (const std::string &source : sources_of(options.operands)) {
         const config::settings &settings = projects.of(source);
         requests.push_back({source, naming_of(options, settings), settings.path});
         all.rules.push_back(options.findings.rules(settings));

@@ -44,11 +44,11 @@ finding_rules finding_options::rules(const config::settings &settings) const {
     return all;
 }
 
-std::unique_ptr<report::writer> finding_options::writer() const {
+std::unique_ptr<report::writer> finding_options::writer(std::vector<report::rule> more) const {
     if (form == "json")
         return report::json_form(print);
     if (form == "sarif")
-        return report::sarif_form(print);
+        return report::sarif_form(print, std::move(more));
     if (form == "github")
         return report::github_form(print);
     if (form == "gitlab")
@@ -64,7 +64,7 @@ void finding_options::fail_source(report::writer &to, const std::string &why) co
     to.fail_source(why);
 }
 
-void add_finding_options(CLI::App &command, finding_options &options) {
+void add_report_options(CLI::App &command, finding_options &options) {
     add_forms(command, options.form, {"text", "json", "sarif", "github", "gitlab"},
               "Form of the findings; text is written to standard error");
     command.add_option("--max", options.text.shown_max, "Show at most N findings as text, errors first; 0: all")
@@ -73,6 +73,17 @@ void add_finding_options(CLI::App &command, finding_options &options) {
         ->capture_default_str();
     command.add_flag("-q,--quiet", options.text.quiet, "Show errors only, without a summary, as text");
     add_colour(command, options.colour);
+}
+
+void add_project_rules(CLI::App &command, finding_options &options) {
+    auto set_count = [&options](bool count) { return [&options, count] { options.warnings_count = count; }; };
+    CLI::Option *werror = command.add_flag_callback("--werror", set_count(true), "Count warnings as errors");
+    command.add_flag_callback("--no-werror", set_count(false), "Do not, whatever cdef.toml says")->excludes(werror);
+    add_project_options(command, options.project);
+}
+
+void add_finding_options(CLI::App &command, finding_options &options) {
+    add_report_options(command, options);
     command.add_option("--warn", options.wanted, "Turn on warning NAME, or all")
         ->type_name("NAME")
         ->allow_extra_args(false)
@@ -81,10 +92,7 @@ void add_finding_options(CLI::App &command, finding_options &options) {
         ->type_name("NAME")
         ->allow_extra_args(false)
         ->check(CLI::IsMember(warning_names()));
-    auto set_count = [&options](bool count) { return [&options, count] { options.warnings_count = count; }; };
-    CLI::Option *werror = command.add_flag_callback("--werror", set_count(true), "Count warnings as errors");
-    command.add_flag_callback("--no-werror", set_count(false), "Do not, whatever cdef.toml says")->excludes(werror);
-    add_project_options(command, options.project);
+    add_project_rules(command, options);
 }
 
 void require_source(const std::string &path) {

@@ -40,14 +40,19 @@ struct finding_options {
     /* What the options say, and where they say nothing, the project file. All warnings are wanted but the unwanted
      * ones; a name that is given both ways is wanted. */
     finding_rules rules(const config::settings &settings) const;
-    /* What writes findings in the form: text to standard error, other forms to standard output. */
-    std::unique_ptr<report::writer> writer() const;
+    /* What writes findings in the form: text to standard error, other forms to standard output. more: rules that
+     * findings may break besides those of sources. */
+    std::unique_ptr<report::writer> writer(std::vector<report::rule> more = {}) const;
     /* Reports a source that could not be read. why: a message that names the source. */
     void fail_source(report::writer &to, const std::string &why) const;
 };
 
-/* Adds --format, --max, --quiet, --color, --warn, --no-warn, --werror, --no-werror, --config and --no-config, whose
- * values are stored in the options; these must stay as long as the command. */
+/* Adds --format, --max, --quiet and --color, which say how findings are shown; */
+void add_report_options(CLI::App &command, finding_options &options);
+/* and --werror, --no-werror, --config and --no-config. */
+void add_project_rules(CLI::App &command, finding_options &options);
+
+/* Adds all of these, and --warn and --no-warn. The options must stay as long as the command. */
 void add_finding_options(CLI::App &command, finding_options &options);
 
 /* Throws check::cannot_check for a database, and names the subcommand that checks it. */

@@ -20,7 +20,7 @@ struct meanings {
 };
 
 /* FAILED also stands for a wrong command line and for output that cannot be written. */
-inline constexpr std::array<meanings, 10> statuses = {{
+inline constexpr std::array<meanings, 11> statuses = {{
     {"verify", "no errors", "errors, or warnings with --werror", "a file cannot be read, or is a text"},
     {"dump", "the database is shown", "", "the database cannot be read, or is not sound (--hex shows it then too)"},
     {"diff", "no difference (with --compat: B can take the place of A)", "differences (with --compat: it cannot)",
@@ -32,6 +32,8 @@ inline constexpr std::array<meanings, 10> statuses = {{
     {"build", "all databases are made or up to date",
      "errors, or warnings with --werror; the databases of the other sources are made",
      "a file cannot be read or written; the other databases are made"},
+    {"gate", "nothing breaks", "something breaks, or a source has errors; with --werror, or warnings",
+     "a file or an older version cannot be read"},
     {"new", "the source is written", "", "the source exists or cannot be written, or no source can have the name"},
     {"explain", "the codes are explained", "", "there is no such code"},
     {"lsp", "the client has shut the server down", "the client ended without that", "standard input cannot be read"},

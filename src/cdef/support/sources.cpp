@@ -1,6 +1,6 @@
 /* sources.cpp: the sources that operands stand for. */
 
-#include "cdef/build/sources.h"
+#include "cdef/support/sources.h"
 
 #include "cdef/support/failure.h"
 
@@ -8,7 +8,7 @@
 #include <filesystem>
 #include <string_view>
 
-namespace cdef::build_command {
+namespace cdef {
 
 namespace {
 
@@ -51,4 +51,4 @@ std::vector<std::string> sources_of(const std::vector<std::string> &operands) {
     return all;
 }
 
-} // namespace cdef::build_command
+} // namespace cdef

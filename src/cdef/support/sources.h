@@ -1,16 +1,16 @@
 /* sources.h: the sources that operands stand for. */
-#ifndef CDGEN_CDEF_BUILD_SOURCES_H
-#define CDGEN_CDEF_BUILD_SOURCES_H
+#ifndef CDGEN_CDEF_SUPPORT_SOURCES_H
+#define CDGEN_CDEF_SUPPORT_SOURCES_H
 
 #include <string>
 #include <vector>
 
-namespace cdef::build_command {
+namespace cdef {
 
 /* Each operand that is a directory stands for all files called *.cdefsrc in it and below it, in the order of their
  * names, except hidden ones. Throws failure for a directory that cannot be read, or has none. */
 std::vector<std::string> sources_of(const std::vector<std::string> &operands);
 
-} // namespace cdef::build_command
+} // namespace cdef
 
 #endif

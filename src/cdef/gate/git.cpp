@@ -1,0 +1,85 @@
+/* git.cpp: what the program git says of a repository. */
+
+#include "cdef/gate/git.h"
+
+#include "cdef/support/failure.h"
+
+#include <array>
+#include <cerrno>
+#include <cstddef>
+#include <cstring>
+#include <fcntl.h>
+#include <spawn.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+namespace cdef::gate_command {
+
+namespace {
+
+[[noreturn]] void fail(int error) {
+    throw failure(std::string("git: cannot run: ") + std::strerror(error));
+}
+
+std::string all_of(int fd) {
+    constexpr std::size_t STEP = 65536;
+    std::array<char, STEP> portion;
+    std::string text;
+    for (;;) {
+        ssize_t got = read(fd, portion.data(), portion.size());
+        if (got < 0 && errno == EINTR)
+            continue;
+        if (got <= 0)
+            return text;
+        text.append(portion.data(), static_cast<std::size_t>(got));
+    }
+}
+
+/* What a started program is given: nothing to read, its output to a pipe, its messages to nobody. */
+class redirections {
+public:
+    explicit redirections(int out) {
+        posix_spawn_file_actions_init(&actions);
+        posix_spawn_file_actions_addopen(&actions, STDIN_FILENO, "/dev/null", O_RDONLY, 0);
+        posix_spawn_file_actions_adddup2(&actions, out, STDOUT_FILENO);
+        posix_spawn_file_actions_addopen(&actions, STDERR_FILENO, "/dev/null", O_WRONLY, 0);
+    }
+    redirections(const redirections &) = delete;
+    redirections &operator=(const redirections &) = delete;
+    ~redirections() {
+        posix_spawn_file_actions_destroy(&actions);
+    }
+
+    posix_spawn_file_actions_t actions;
+};
+
+} // namespace
+
+std::optional<std::string> git(const std::string &directory, const std::vector<std::string> &arguments) {
+    std::vector<std::string> words = {"git", "-C", directory.empty() ? "." : directory, "--no-pager"};
+    words.insert(words.end(), arguments.begin(), arguments.end());
+    std::vector<char *> argv;
+    for (std::string &word : words)
+        argv.push_back(word.data());
+    argv.push_back(nullptr);
+    std::array<int, 2> ends = {};
+    if (pipe2(ends.data(), O_CLOEXEC) != 0)
+        fail(errno);
+    pid_t child = 0;
+    int error = 0;
+    {
+        redirections to(ends[1]);
+        error = posix_spawnp(&child, "git", &to.actions, nullptr, argv.data(), environ);
+    }
+    close(ends[1]);
+    std::string text = error == 0 ? all_of(ends[0]) : "";
+    close(ends[0]);
+    if (error != 0)
+        fail(error);
+    int status = 0;
+    while (waitpid(child, &status, 0) < 0 && errno == EINTR)
+        ;
+    return WIFEXITED(status) && WEXITSTATUS(status) == 0 ? std::optional(std::move(text)) : std::nullopt;
+}
+
+} // namespace cdef::gate_command

@@ -1,0 +1,319 @@
+"""Test what `cdef gate` finds, where in the source, and what it compares with what.
+
+The rules and their pairs are those of `cdef diff --compat`, which tests/cdef/diff tests; those about recorded numbers are
+tested here."""
+
+import json
+import os
+import subprocess
+
+import pytest
+
+from cases import HEAD, SOURCE, check, expect
+from levels import LEVELS, RULES
+from programs import PROJECT, TESTS
+
+BASE = (TESTS / "cdef/diff/base.cdefsrc").read_text()
+
+# The line of the changed source that a finding is about.
+LINES = {
+    "CMP101": "\tName=Lister", "CMP102": "\tId=61", "CMP103": "PersistentResourceAttribute",
+    "CMP104": "\tDataType=UInt64", "CMP105": "ResourceAction", "CMP201": "PersistentResourceAttribute",
+    "CMP202": "\tProperties=ReqdForDefine", "CMP203": "\tValidValue=0", "CMP204": "\tValidValue=7",
+    "CMP205": "\tVarietyRange=1,1", "CMP206": "\tProperties=ReqdForDefine",
+    "CMP207": "\tProperties=Public,ReqdForDefine,ReadOnly", "CMP208": "\tRange=1,30", "CMP209": "\tPermission=a",
+    "CMP301": "\tName=Border", "CMP302": "DynamicResourceAttribute", "CMP303": "\tDataType=Float64",
+}
+ATTRIBUTE = ("PersistentResourceAttribute\n\tName={}\n\tDescription=3\n\tDisplayName=4\n\tId={}\n\tDataType={}\n"
+             "\tVarietyRange=1,2\n")
+DYNAMIC = ATTRIBUTE.replace("Persistent", "Dynamic") + "\tVariableType=State\n"
+ACTION = "ResourceAction\n\tName={}\n\tDescription=5\n\tDisplayName=6\n\tId={}\n\tVarietyRange=1,2\n"
+
+
+def changed(changes):
+    """The base with other lines in place of some."""
+    text = "\n" + BASE
+    for old, new in changes:
+        check(text.count("\n" + old) == 1, "not once in the base:", old)
+        text = text.replace("\n" + old, "\n" + new)
+    return text[1:]
+
+
+def write(world, name, text):
+    """A text file."""
+    world.path(name).parent.mkdir(parents=True, exist_ok=True)
+    world.write(name, text if isinstance(text, bytes) else text.encode())
+
+
+def found(world, *arguments, **more):
+    """The status, and the findings of all sources."""
+    result = world.inspect("gate", "--format=json", *arguments, **more)
+    check(result.returncode < 2, result.stderr)
+    return result.returncode, [each for source in json.loads(result.stdout)["sources"] for each in source["findings"]]
+
+
+def codes(findings):
+    """With those in notes."""
+    return ({each["code"] for each in findings} |
+            {note["message"][-7:-1] for each in findings for note in each["notes"] if note["message"].endswith("]")})
+
+
+def with_class(*stanzas):
+    """A class with these stanzas."""
+    return HEAD.decode() + "".join(stanzas)
+
+
+# ---- Rules -----------------------------------------------------------------------------------------------------------
+
+
+@pytest.mark.parametrize("code,breaking,line,similar", RULES, ids=[rule[0] for rule in RULES])
+def test_rule(world, code, breaking, line, similar):
+    """From its level on, with the line of the source; not by the similar change."""
+    levels = {"1": "readers", "2": "clients", "3": "stored"}
+    level = levels[code[3]]
+    write(world, "old.cdefsrc", BASE)
+    write(world, "new.cdefsrc", changed(breaking))
+    status, findings = found(world, f"--level={level}", "--against=old.cdefsrc", "new.cdefsrc")
+    check(status == 1 and code in codes(findings), findings)
+    here = [each for each in findings if each["message"][2:].split(" (")[0] == line.split(" (")[0]]
+    check(len(here) == 1 and here[0]["source"] == LINES[code], findings)
+    lines = changed(breaking).split("\n")
+    check(lines[here[0]["line"] - 1] == LINES[code], "line", here[0]["line"])
+    for lower in LEVELS[: LEVELS.index(level)]:
+        check(code not in codes(found(world, f"--level={lower}", "--against=old.cdefsrc", "new.cdefsrc")[1]), lower)
+    write(world, "new.cdefsrc", changed(similar))
+    _, findings = found(world, "--level=stored", "--against=old.cdefsrc", "new.cdefsrc")
+    check(code not in codes(findings), findings)
+
+
+def test_every_rule_has_its_line():
+    """No rule is left out."""
+    check([rule[0] for rule in RULES] == list(LINES), "rules")
+
+
+@pytest.mark.parametrize("level", LEVELS)
+def test_is_silent_against_itself(world, level):
+    """As a source, as a database of either byte order, and in a directory."""
+    write(world, "new/class.cdefsrc", BASE)
+    for order in ("little", "big"):
+        expect(world.inspect("build", "--no-warn=all", "--byte-order", order, "-o", f"{order}.cdef", "new/class.cdefsrc"), 0)
+        expect(world.inspect("gate", "--level", level, "--against", f"{order}.cdef", "new/class.cdefsrc"), 0)
+    expect(world.inspect("gate", "--level", level, "--against", "big.cdef", "little.cdef"), 0)
+    expect(world.inspect("gate", "--level", level, "--against", "new", "new"), 0)
+
+
+def test_shows_what_breaks(world):
+    """As text; by default what breaks readers."""
+    write(world, "old.cdefsrc", with_class(ATTRIBUTE.format("Size", 1, "Int32")))
+    write(world, "new.cdefsrc", with_class(ATTRIBUTE.format("Size", 2, "Int32")))
+    line = HEAD.count(b"\n") + 5
+    expect(world.inspect("gate", "--against=old.cdefsrc", "new.cdefsrc"), 1,
+           b"new.cdefsrc:%d:5: error: ~ PersistentResourceAttribute 'Size': Id 1 -> 2 "
+           b"(readers know it by its number) [CMP102]\n"
+           b"   %d | \tId=2\n      | \t   ^\n1 error and 0 warnings\n" % (line, line))
+
+
+def test_shows_databases_without_lines(world):
+    """There is no source to show."""
+    for number in (1, 2):
+        write(world, SOURCE, with_class(ATTRIBUTE.format("Size", number, "Int32")))
+        expect(world.inspect("build", "-o", f"{number}.cdef", SOURCE), 0)
+    expect(world.inspect("gate", "--against=1.cdef", "2.cdef"), 1,
+           b"2.cdef: error: ~ PersistentResourceAttribute 'Size': Id 1 -> 2 (readers know it by its number) [CMP102]\n"
+           b"1 error and 0 warnings\n")
+
+
+@pytest.mark.parametrize("form", ["sarif", "github", "gitlab"])
+def test_has_the_forms_of_check(world, form):
+    """With the code and the line."""
+    write(world, "old.cdefsrc", with_class(ATTRIBUTE.format("Size", 1, "Int32")))
+    write(world, "new.cdefsrc", with_class(ATTRIBUTE.format("Size", 2, "Int32")))
+    result = world.inspect("gate", "--format", form, "--against=old.cdefsrc", "new.cdefsrc")
+    check(result.returncode == 1 and b"CMP102" in result.stdout, result)
+    if form == "sarif":
+        run = json.loads(result.stdout)["runs"][0]
+        rules = run["tool"]["driver"]["rules"]
+        check([rules[each["ruleIndex"]]["id"] for each in run["results"]] == ["CMP102"], "rule")
+
+
+def test_names_a_nameless_class_after_the_older_one(world):
+    """Which has been called after its database."""
+    nameless = HEAD.replace(b"\tName=Disk\n", b"")
+    write(world, "new.cdefsrc", nameless)
+    world.path("old").mkdir()
+    expect(world.inspect("build", "-q", "-o", "old/place.cdef", "new.cdefsrc"), 0)
+    expect(world.inspect("gate", "--against=old/place.cdef", "new.cdefsrc"), 0)
+
+
+# ---- Older versions --------------------------------------------------------------------------------------------------
+
+
+def test_looks_for_the_file_in_a_directory(world):
+    """A database before a source; a class that is new has none."""
+    old, new = with_class(ATTRIBUTE.format("Size", 1, "Int32")), with_class(ATTRIBUTE.format("Size", 2, "Int32"))
+    write(world, "new/a.cdefsrc", new)
+    world.path("old").mkdir()
+    expect(world.inspect("gate", "--against=old", "new/a.cdefsrc"), 0)
+    write(world, "old/a.cdefsrc", old)
+    check(codes(found(world, "--against=old", "new")[1]) == {"CMP102"}, "source")
+    for name in ("a.cdef", "a.be.cdef"):
+        expect(world.inspect("build", "-o", f"old/{name}", "new/a.cdefsrc"), 0)
+        expect(world.inspect("gate", "--against=old", "new"), 0)
+        world.path(f"old/{name}").unlink()
+
+
+def git(world, *arguments):
+    """A run of git, whoever the user is."""
+    who = {f"GIT_{role}_{what}": "someone@example.com" for role in ("AUTHOR", "COMMITTER") for what in ("NAME", "EMAIL")}
+    subprocess.run(["git", *arguments], cwd=world.path("."), check=True, stdout=subprocess.DEVNULL,
+                   env={**os.environ, **who, "GIT_CONFIG_GLOBAL": "/dev/null", "GIT_CONFIG_NOSYSTEM": "1"})
+
+
+def test_takes_older_versions_from_git(world):
+    """The same file at a revision, or a file or directory there."""
+    old, new = with_class(ATTRIBUTE.format("Size", 1, "Int32")), with_class(ATTRIBUTE.format("Size", 2, "Int32"))
+    write(world, "classes/a.cdefsrc", old)
+    git(world, "init", "-q", ".")
+    git(world, "add", "-A")
+    git(world, "commit", "-qm", "old")
+    write(world, "classes/a.cdefsrc", new)
+    write(world, "classes/b.cdefsrc", new.replace("Name=Disk", "Name=New").replace("mgr1.cat", "b.cat"))
+    for against in ("git:HEAD", "git:HEAD:classes", "git:HEAD:./"):
+        status, findings = found(world, "--against", against, "classes")
+        check((status, codes(findings)) == (1, {"CMP102"}), against, findings)
+    check(codes(found(world, "--against=git:HEAD:classes/a.cdefsrc", "classes/a.cdefsrc")[1]) == {"CMP102"}, "file")
+    git(world, "commit", "-qam", "new")
+    expect(world.inspect("gate", "--against=git:HEAD", "classes/a.cdefsrc"), 0)
+    check(codes(found(world, "--against=git:HEAD~1", "a.cdefsrc", cwd=world.path("classes"))[1]) == {"CMP102"}, "elsewhere")
+
+
+def test_refuses_older_versions_that_are_not_there(world):
+    """Neither files nor revisions nor git."""
+    write(world, "a.cdefsrc", HEAD)
+    expect(world.inspect("gate", "--against=none", "a.cdefsrc"), 2, b"cdef: none: No such file or directory\n")
+    expect(world.inspect("gate", "a.cdefsrc"), 2,
+           b"cdef: a.cdefsrc: nothing to compare it with: name an older version with --against\n")
+    expect(world.inspect("gate", "--against=git:-x", "a.cdefsrc"), 2, b"cdef: --against git:-x: not a revision\n")
+    missing = b"cdef: a.cdefsrc: no git repository has it, or its repository has no revision HEAD\n"
+    expect(world.inspect("gate", "--against=git:HEAD", "a.cdefsrc"), 2, missing)
+    without_git = world.inspect("gate", "--against=git:HEAD", "a.cdefsrc", env={"PATH": "/nowhere"})
+    check(without_git.returncode == 2 and b"cdef: git: cannot run: " in without_git.stderr, without_git)
+    git(world, "init", "-q", ".")
+    git(world, "commit", "-qm", "nothing", "--allow-empty")
+    expect(world.inspect("gate", "--against=git:HEAD:none", "a.cdefsrc"), 2,
+           b"cdef: git:HEAD:none: no such file or directory at that revision\n")
+    expect(world.inspect("gate", "--against=a.cdefsrc", "a.cdefsrc", "a.cdefsrc"), 2,
+           b"cdef: --against names one file, and there are 2 classes\n")
+
+
+def test_refuses_what_cannot_be_compared(world):
+    """Sources with errors are shown as check shows them; older versions with errors are not compared with."""
+    wrong = HEAD.replace(b"Description=1", b"Descripton=1", 1)
+    write(world, "good.cdefsrc", HEAD)
+    write(world, "wrong.cdefsrc", wrong)
+    write(world, "damaged.cdef", world.good(HEAD)[:100])
+    checked = world.inspect("check", "wrong.cdefsrc")
+    expect(world.inspect("gate", "--against=good.cdefsrc", "wrong.cdefsrc"), 1, checked.stderr)
+    for old, why in (("wrong.cdefsrc", b"not a source that compiles; 'cdef check' says why"),
+                     ("damaged.cdef", b"not a sound database; 'cdef verify' says why")):
+        expect(world.inspect("gate", f"--against={old}", "good.cdefsrc"), 2, b"cdef: %s: %s\n" % (old.encode(), why))
+    expect(world.inspect("gate", "--against=good.cdefsrc", "none.cdefsrc"), 2,
+           b"cdef: none.cdefsrc: No such file or directory\n")
+
+
+# ---- Numbers ---------------------------------------------------------------------------------------------------------
+
+
+def recorded(world, *stanzas, name="ids.lock"):
+    """The file of numbers after an update with a class of these stanzas."""
+    write(world, "a.cdefsrc", with_class(*stanzas))
+    expect(world.inspect("gate", "--update", "--ids", name, "a.cdefsrc"), 0)
+    return world.read(name).decode().split("\n")[1:-1]
+
+
+def test_records_numbers_forever(world):
+    """In a fixed order, each once; those that are gone stay."""
+    size, mode = "Disk\tPersistentResourceAttribute\t1\tInt32\tSize", "Disk\tDynamicResourceAttribute\t2\tString\tMode"
+    check_action = "Disk\tResourceAction\t1\t-\tCheck"
+    stanzas = (DYNAMIC.format("Mode", 2, "String"), ATTRIBUTE.format("Size", 1, "Int32"), ACTION.format("Check", 1))
+    check(recorded(world, *stanzas) == [size, mode, check_action], "all")
+    check(recorded(world, *stanzas[:1]) == [size, mode, check_action], "gone")
+    with world.left_alone("ids.lock"):
+        recorded(world, *stanzas)
+
+
+@pytest.mark.parametrize("code,first,second,similar", [
+    ("CMP401", ATTRIBUTE.format("Size", 1, "Int32"), ATTRIBUTE.format("Room", 1, "Int32"), ACTION.format("Room", 1)),
+    ("CMP401", ACTION.format("Check", 1), ACTION.format("Repair", 1), ACTION.format("Repair", 2)),
+    ("CMP402", ATTRIBUTE.format("Size", 1, "Int32"), DYNAMIC.format("Size", 1, "Int32"), DYNAMIC.format("Size", 2, "Int32")),
+    ("CMP403", ATTRIBUTE.format("Size", 1, "Int32"), ATTRIBUTE.format("Size", 1, "UInt32"),
+     ATTRIBUTE.format("Size", 2, "UInt32")),
+])
+def test_refuses_a_number_that_was_something_else(world, code, first, second, similar):
+    """Unless it is accepted with --update; another number, or that of another kind of object, is new."""
+    recorded(world, first)
+    recorded(world)
+    write(world, "a.cdefsrc", with_class(second))
+    status, findings = found(world, "a.cdefsrc")
+    check((status, codes(findings)) == (1, {code}), findings)
+    check(findings[0]["source"] in ("\tId=1", "\tDataType=UInt32"), findings)
+    write(world, "a.cdefsrc", with_class(similar))
+    status, findings = found(world, "a.cdefsrc")
+    check((status, codes(findings)) == (0, {"CMP404"}), findings)
+    recorded(world, second)
+    expect(world.inspect("gate", "a.cdefsrc"), 0)
+
+
+def test_warns_of_numbers_that_are_not_recorded(world):
+    """An error with --werror."""
+    recorded(world)
+    write(world, "a.cdefsrc", with_class(ATTRIBUTE.format("Size", 1, "Int32")))
+    line = HEAD.count(b"\n") + 5
+    said = (b"a.cdefsrc:%d:5: warning: the number 1 of the `PersistentResourceAttribute` `Size` of type `Int32` is not "
+            b"recorded [CMP404 unrecorded-number]\n   %d | \tId=1\n      | \t   ^\n0 errors and 1 warning\n" % (line, line))
+    expect(world.inspect("gate", "a.cdefsrc"), 0, said)
+    expect(world.inspect("gate", "--werror", "a.cdefsrc"), 1, said)
+
+
+def test_refuses_files_of_numbers_that_say_something_else(world):
+    """Or two things; with the line."""
+    write(world, "a.cdefsrc", HEAD)
+    line = "Disk\tPersistentResourceAttribute\t1\tInt32\tSize\n"
+    expect(world.inspect("gate", "--ids=none", "a.cdefsrc"), 2, b"cdef: none: No such file or directory\n")
+    for text in (line.replace("\t1\t", "\tx\t"), line.replace("Persistent", "Persisten"), line.replace("\tSize", ""),
+                 line.replace("Size", "Size\tx"), line.replace("Size", "Si\\qze"), "<<<<<<< ours\n"):
+        write(world, "ids.lock", "# comment\n\n" + text)
+        expect(world.inspect("gate", "a.cdefsrc"), 2,
+               b"cdef: ids.lock:3: expected class, kind, number, type and name, with tabs between\n")
+    write(world, "ids.lock", line + line.replace("Persistent", "Dynamic").replace("Size", "Room"))
+    expect(world.inspect("gate", "a.cdefsrc"), 2, b"cdef: ids.lock:2: the number is also that of the "
+           b"`PersistentResourceAttribute` `Size` of type `Int32`\n")
+    write(world, "ids.lock", line + line)
+    expect(world.inspect("gate", "a.cdefsrc"), 0)
+
+
+# ---- Project files ---------------------------------------------------------------------------------------------------
+
+
+def test_reads_the_project_file(world):
+    """Level, older version, numbers and --werror; options win."""
+    change = RULES[13]
+    check(change[0] == "CMP209", change)
+    write(world, "p/old/a.cdefsrc", BASE)
+    write(world, "p/a.cdefsrc", changed(change[1]))
+    write(world, "p/cdef.toml", "[gate]\nlevel = 'clients'\nbaseline = 'old'\n")
+    check(codes(found(world, "p/a.cdefsrc")[1]) == {"CMP209"}, "not read")
+    check(found(world, "--level=readers", "p/a.cdefsrc") == (0, []), "level")
+    check(found(world, "--against=p/a.cdefsrc", "p/a.cdefsrc") == (0, []), "baseline")
+    write(world, "p/cdef.toml", "[warnings]\nwerror = true\n[gate]\nbaseline = 'old'\nids = 'numbers'\n")
+    expect(world.inspect("gate", "p/a.cdefsrc"), 2, b"cdef: p/numbers: No such file or directory\n")
+    expect(world.inspect("gate", "--update", "p/a.cdefsrc"), 0)
+    check(world.path("p/numbers").exists() and found(world, "p/a.cdefsrc") == (0, []), "numbers")
+    write(world, "p/numbers", "")
+    check(found(world, "p/a.cdefsrc")[0] == 1 and found(world, "--no-werror", "p/a.cdefsrc")[0] == 0, "werror")
+
+
+def test_document_has_the_rules():
+    """Those about numbers."""
+    text = (PROJECT / "docs/gate.md").read_text()
+    check(all(f"| `CMP40{number}` |" in text for number in range(1, 5)), "rules")

@@ -1,9 +1,12 @@
 /* github.cpp: findings as the workflow commands of GitHub, which shows them beside the lines of a change. */
 
+#include "report/github.h"
+
 #include "report/places.h"
 #include "report/report.h"
 #include "text/shown.h"
 
+#include <algorithm>
 #include <utility>
 
 namespace report {
@@ -31,33 +34,32 @@ public:
         file = name;
     }
     void add(const check::finding &found) override {
-        text += std::string(found.error ? "::error" : "::warning") + " file=" + escaped(file, true);
-        add_place(found);
-        text += ",title=" + escaped(found.code, true) + "::" + escaped(found.text, false);
+        std::string lines = found.text;
         for (const check::note &more : found.notes)
-            text += "%0A" + escaped(more.text, false);
-        text += "\n";
+            lines += "\n" + more.text;
+        github_command command = {found.error, file, place_of(found), found.code};
+        text += command.with(lines);
         write_if_full();
     }
     void end_source(const check::totals & /* count */) override {
         write();
     }
     void fail_source(const std::string &why) override {
-        text += "::error file=" + escaped(file, true) + "::" + escaped(why, false) + "\n";
+        text += github_command{.file = file}.with(why);
         write();
     }
     void close() override {}
 
 private:
-    void add_place(const check::finding &found) {
+    static std::string place_of(const check::finding &found) {
         if (found.at.line == 0)
-            return;
-        text += ",line=" + std::to_string(line_in_file(found.at));
+            return {};
+        std::string place = ",line=" + std::to_string(line_in_file(found.at));
         if (found.at.column == 0)
-            return;
+            return place;
         character_range in_file = characters_in_file(found.at, found.source);
-        text += ",col=" + std::to_string(in_file.column);
-        text += ",endColumn=" + std::to_string(in_file.column + std::max<size_t>(in_file.length, 1) - 1);
+        place += ",col=" + std::to_string(in_file.column);
+        return place + ",endColumn=" + std::to_string(in_file.column + std::max<size_t>(in_file.length, 1) - 1);
     }
     void write_if_full() {
         constexpr size_t PORTION = 65536;
@@ -75,6 +77,19 @@ private:
 };
 
 } // namespace
+
+std::string github_command::with(std::string_view lines) const {
+    std::string text = std::string(error ? "::error" : "::warning") + " file=" + escaped(file, true) + place;
+    if (!title.empty())
+        text += ",title=" + escaped(title, true);
+    text += "::";
+    for (std::size_t begin = 0; begin <= lines.size();) {
+        std::size_t end = std::min(lines.find('\n', begin), lines.size());
+        text += (begin == 0 ? "" : "%0A") + escaped(lines.substr(begin, end - begin), false);
+        begin = end + 1;
+    }
+    return text + "\n";
+}
 
 std::unique_ptr<writer> github_form(output to) {
     return std::make_unique<github_writer>(std::move(to));

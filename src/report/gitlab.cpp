@@ -1,5 +1,7 @@
 /* gitlab.cpp: findings as the code quality report of GitLab. */
 
+#include "report/gitlab.h"
+
 #include "report/fingerprint.h"
 #include "report/places.h"
 #include "report/report.h"
@@ -20,9 +22,8 @@ std::string_view path_of(std::string_view file) {
 
 class gitlab_writer : public writer {
 public:
-    explicit gitlab_writer(output written_to) : to(std::move(written_to)) {
-        to.open_list();
-    }
+    explicit gitlab_writer(output written_to) : to(std::move(written_to)) {}
+
     void begin_source(const std::string &name) override {
         file = name;
     }
@@ -31,40 +32,41 @@ public:
         for (const check::note &more : found.notes)
             description += "; " + more.text;
         std::string mark = made.of(file, found).text();
-        const char *severity = found.error ? "major" : "minor";
-        to.add_whole([&] { add_entry(description, found.code, mark, severity, line_in_file(found.at)); });
+        std::size_t line = std::max<std::size_t>(line_in_file(found.at), 1);
+        to.add(file, {std::move(description), found.code, std::move(mark), found.error ? "major" : "minor", line});
     }
     void end_source(const check::totals & /* count */) override {}
     void fail_source(const std::string &why) override {
-        add_entry(why, "unreadable", "unreadable", "blocker", 1);
+        to.fail(file, why);
     }
     void close() override {
         to.close();
     }
 
 private:
-    void add_entry(const std::string &description, const char *code, const std::string &mark, const char *severity,
-                   size_t line) {
-        to.open_object();
-        to.add_text("description", description);
-        to.add_text("check_name", code);
-        to.add_text("fingerprint", hexadecimal(hash_of(mark, hash_of(path_of(file)))));
-        to.add_text("severity", severity);
-        to.open_object("location");
-        to.add_text("path", path_of(file));
-        to.open_object("lines");
-        to.add_number("begin", std::max<size_t>(line, 1));
-        to.close();
-        to.close();
-        to.close();
-    }
-
-    json_writer to;
+    gitlab_report to;
     std::string file;
     fingerprints made;
 };
 
 } // namespace
+
+void gitlab_report::add(std::string_view file, const gitlab_entry &entry) {
+    std::string_view path = path_of(file);
+    to.add_whole([&] {
+        to.open_object();
+        to.add_text("description", entry.description);
+        to.add_text("check_name", entry.code);
+        to.add_text("fingerprint", hexadecimal(hash_of(entry.mark, hash_of(path))));
+        to.add_text("severity", entry.severity);
+        to.open_object("location");
+        to.add_text("path", path);
+        to.open_object("lines");
+        to.add_number("begin", entry.line);
+        for (int levels = 3; levels > 0; --levels)
+            to.close();
+    });
+}
 
 std::unique_ptr<writer> gitlab_form(output to) {
     return std::make_unique<gitlab_writer>(std::move(to));

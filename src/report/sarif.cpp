@@ -1,5 +1,7 @@
 /* sarif.cpp: findings as SARIF 2.1.0. */
 
+#include "report/sarif.h"
+
 #include "report/fingerprint.h"
 #include "report/json_text.h"
 #include "report/places.h"
@@ -32,12 +34,6 @@ json region_of(const place &at, std::string_view source) {
     region["startColumn"] = in_file.column;
     region["endColumn"] = in_file.column + in_file.length;
     return region;
-}
-
-json artifact_of(const std::string &file) {
-    json artifact;
-    artifact["uri"] = uri_of(file);
-    return artifact;
 }
 
 json location_of(const std::string &file, const place &at, std::string_view source) {
@@ -116,92 +112,117 @@ json json_of(const rule &known) {
 
 class sarif_writer : public writer {
 public:
-    sarif_writer(output written_to, std::vector<rule> more_rules)
-        : to(std::move(written_to)), more(std::move(more_rules)) {
-        to.open_object();
-        to.add_text("$schema", "https://json.schemastore.org/sarif-2.1.0.json");
-        to.add_text("version", "2.1.0");
-        to.open_list("runs");
-        to.open_object();
-        to.open_object("tool");
-        add_driver();
-        to.close();
-        to.add_text("columnKind", "unicodeCodePoints");
-        to.open_list("results");
-    }
+    sarif_writer(output written_to, const std::vector<rule> &more)
+        : rules(with(more)), to(std::move(written_to), "cdef check", rules) {}
+
     void begin_source(const std::string &name) override {
         file = name;
     }
     void add(const finding &found) override {
-        to.add_whole(
-            [&] { to.add_json({}, json_line(result_of(file, found, made.of(file, found), index_of(found.code)))); });
+        to.add(result_of(file, found, made.of(file, found), index_of(found.code)));
     }
     void end_source(const check::totals & /* count */) override {}
     void fail_source(const std::string &why) override {
-        json notice;
-        notice["level"] = "error";
-        notice["message"]["text"] = why;
-        json location;
-        location["physicalLocation"]["artifactLocation"] = artifact_of(file);
-        notice["locations"].push_back(std::move(location));
-        unreadable.push_back(json_line(notice));
+        to.fail(file, why);
     }
     void close() override {
         to.close();
-        add_invocation();
-        for (int levels = 3; levels > 0; --levels)
-            to.close();
     }
 
 private:
-    /* Among all rules, those of sources first. */
+    /* All rules, those of sources first. */
+    static std::vector<rule> with(const std::vector<rule> &more) {
+        std::vector<rule> all = all_rules();
+        all.insert(all.end(), more.begin(), more.end());
+        return all;
+    }
     std::size_t index_of(std::string_view code) const {
-        std::size_t index = rule_index(code);
-        auto of_more = std::find_if(more.begin(), more.end(), [code](const rule &each) { return each.code == code; });
-        return index < all_rules().size() ? index : index + static_cast<std::size_t>(of_more - more.begin());
-    }
-    void add_driver() {
-        to.open_object("driver");
-        to.add_text("name", "cdef check");
-        to.add_text("semanticVersion", CDGEN_VERSION);
-        to.add_text("version", CDGEN_VERSION);
-        to.add_text("informationUri", "man:cdef(1)");
-        to.open_list("rules");
-        for (const std::vector<rule> &some : {all_rules(), more})
-            for (const rule &known : some)
-                to.add_json({}, json_line(json_of(known)));
-        to.close();
-        to.close();
-    }
-    void add_invocation() {
-        to.open_list("invocations");
-        to.open_object();
-        to.add_truth("executionSuccessful", unreadable.empty());
-        if (!unreadable.empty()) {
-            to.open_list("toolExecutionNotifications");
-            for (const std::string &notice : unreadable)
-                to.add_json({}, notice);
-            to.close();
-        }
-        to.close();
-        to.close();
+        auto found = std::find_if(rules.begin(), rules.end(), [code](const rule &each) { return each.code == code; });
+        return static_cast<std::size_t>(found - rules.begin());
     }
 
-    json_writer to;
-    std::vector<rule> more;
+    std::vector<rule> rules;
+    sarif_log to;
     std::string file;
     fingerprints made;
-    std::vector<std::string> unreadable; /* a notification for each such source */
 };
 
 } // namespace
+
+json artifact_of(const std::string &file) {
+    json artifact;
+    artifact["uri"] = uri_of(file);
+    return artifact;
+}
+
+sarif_log::sarif_log(output written_to, std::string_view tool, std::span<const rule> rules)
+    : to(std::move(written_to)) {
+    to.open_object();
+    to.add_text("$schema", "https://json.schemastore.org/sarif-2.1.0.json");
+    to.add_text("version", "2.1.0");
+    to.open_list("runs");
+    to.open_object();
+    to.open_object("tool");
+    add_driver(tool, rules);
+    to.close();
+    to.add_text("columnKind", "unicodeCodePoints");
+    to.open_list("results");
+}
+
+void sarif_log::add_driver(std::string_view tool, std::span<const rule> rules) {
+    to.open_object("driver");
+    to.add_text("name", tool);
+    to.add_text("semanticVersion", CDGEN_VERSION);
+    to.add_text("version", CDGEN_VERSION);
+    to.add_text("informationUri", "man:cdef(1)");
+    to.open_list("rules");
+    for (const rule &known : rules)
+        to.add_json({}, json_line(json_of(known)));
+    to.close();
+    to.close();
+}
+
+void sarif_log::add(const json &result) {
+    to.add_whole([&] { to.add_json({}, json_line(result)); });
+}
+
+void sarif_log::fail(const std::string &file, const std::string &why) {
+    json notice;
+    notice["level"] = "error";
+    notice["message"]["text"] = why;
+    json location;
+    location["physicalLocation"]["artifactLocation"] = artifact_of(file);
+    notice["locations"].push_back(std::move(location));
+    unreadable.push_back(json_line(notice));
+}
+
+void sarif_log::add_invocation() {
+    to.open_list("invocations");
+    to.open_object();
+    to.add_truth("executionSuccessful", unreadable.empty());
+    if (!unreadable.empty()) {
+        to.open_list("toolExecutionNotifications");
+        for (const std::string &notice : unreadable)
+            to.add_json({}, notice);
+        to.close();
+    }
+    to.close();
+    to.close();
+}
+
+void sarif_log::close() {
+    to.close();
+    add_invocation();
+    for (int levels = 3; levels > 0; --levels)
+        to.close();
+}
 
 std::unique_ptr<writer> sarif_form(output to) {
     return sarif_form(std::move(to), {});
 }
 
 std::unique_ptr<writer> sarif_form(output to, std::vector<rule> more) {
-    return std::make_unique<sarif_writer>(std::move(to), std::move(more));
+    return std::make_unique<sarif_writer>(std::move(to), more);
 }
 
 } // namespace report

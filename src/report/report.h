@@ -35,7 +35,7 @@ public:
 std::unique_ptr<writer> json_form(output to);
 std::unique_ptr<writer> sarif_form(output to);
 /* more: the rules that findings may break besides those of all_rules(). */
-std::unique_ptr<writer> sarif_form(output to, std::vector<rule> more);
+std::unique_ptr<writer> sarif_form(output to, const std::vector<rule> &more);
 /* The code quality report of GitLab. */
 std::unique_ptr<writer> gitlab_form(output to);
 

@@ -5,8 +5,6 @@
 #include "check/check.h"
 #include "language/messages.h"
 
-#include <algorithm>
-
 namespace report {
 
 namespace {
@@ -29,12 +27,6 @@ std::string help_of(std::string_view cause, std::string_view cure) {
 const std::vector<rule> &all_rules() {
     static const std::vector<rule> all = make_rules();
     return all;
-}
-
-std::size_t rule_index(std::string_view code) {
-    const std::vector<rule> &all = all_rules();
-    auto found = std::find_if(all.begin(), all.end(), [code](const rule &known) { return known.code == code; });
-    return static_cast<std::size_t>(found - all.begin());
 }
 
 } // namespace report

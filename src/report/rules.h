@@ -2,7 +2,6 @@
 #ifndef CDGEN_REPORT_RULES_H
 #define CDGEN_REPORT_RULES_H
 
-#include <cstddef>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -20,9 +19,6 @@ struct rule {
 
 /* The errors, then the warnings. */
 const std::vector<rule> &all_rules();
-
-/* The position of a code in all_rules(); their number for one that is not among them. */
-std::size_t rule_index(std::string_view code);
 
 /* What help says of a cause and a cure. */
 std::string help_of(std::string_view cause, std::string_view cure);

@@ -221,7 +221,7 @@ std::unique_ptr<writer> sarif_form(output to) {
     return sarif_form(std::move(to), {});
 }
 
-std::unique_ptr<writer> sarif_form(output to, std::vector<rule> more) {
+std::unique_ptr<writer> sarif_form(output to, const std::vector<rule> &more) {
     return std::make_unique<sarif_writer>(std::move(to), more);
 }
 

@@ -172,12 +172,13 @@ void expect_causes(const json &findings) {
 }
 
 void look_at_verify(const outcome &came, const bytes &image, const words &form) {
+    auto has = [&](const char *word) { return std::find(form.begin(), form.end(), word) != form.end(); };
     if (is_text(image)) {
-        fuzz::require(came.status == cdef::FAILED && came.out.empty(), "a text is verified");
+        bool says_so = has("--json") || has("--format"); /* the other forms have an entry for it */
+        fuzz::require(came.status == cdef::FAILED && came.out.empty() != says_so, "a text is verified");
         fuzz::require(came.err.find("a text, not a database") != std::string::npos, "a text is not called one");
         return;
     }
-    auto has = [&](const char *word) { return std::find(form.begin(), form.end(), word) != form.end(); };
     judgement is = judge(image);
     bool passes = has("--werror") ? !is.found : is.sound;
     fuzz::require(came.status == (passes ? cdef::OK : cdef::FOUND) && came.err.empty(), "another verdict");
@@ -185,7 +186,9 @@ void look_at_verify(const outcome &came, const bytes &image, const words &form) 
         json file = parsed(came.out).at("files").at(0);
         fuzz::require(file.at("sound") == passes, "another verdict in JSON");
         expect_causes(file.at("findings"));
-    } else
+    } else if (has("sarif"))
+        fuzz::require(parsed(came.out).at("runs").at(0).at("results").empty() != is.found, "other results in SARIF");
+    else
         fuzz::require(came.out.empty() != (has("--quiet") ? !is.sound : is.found), "findings are not told, or none");
 }
 
@@ -334,6 +337,13 @@ const std::array<form, 16> forms = {{
     {{"check", "--werror"}, look_at_check},
 }};
 
+/* Taken in the place of the form "verify" by some bytes. */
+constexpr std::uint8_t OTHERWISE = 0x60;
+const std::array<form, 2> other_forms = {{
+    {{"verify", "--format", "sarif"}, look_at_verify},
+    {{"verify", "--format", "github"}, look_at_verify},
+}};
+
 /* A source's findings are those of the file as it is, whatever would be corrected. */
 const form correcting = {{"check", "--fix", "--dry-run"}, look_at_check};
 constexpr unsigned CORRECTING = 0x1C; /* the first form of check, with bit 4 */
@@ -417,12 +427,19 @@ bool takes_command_line(std::span<const std::uint8_t> data) {
     return (hash >> 16) % ONE_IN == 0;
 }
 
+const form &form_for(std::uint8_t choice) {
+    if ((choice & 0x1F) == CORRECTING)
+        return correcting;
+    bool is_verify = (choice & 0xF) == 0;
+    return is_verify && (choice & OTHERWISE) == OTHERWISE ? other_forms.at(choice >> 7) : forms.at(choice & 0xF);
+}
+
 } // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size) {
     if (size == 0)
         return 0;
-    const form &with = (data[0] & 0x1F) == CORRECTING ? correcting : forms[data[0] & 0xF];
+    const form &with = form_for(data[0]);
     std::span<const std::byte> rest = std::as_bytes(std::span(data, size)).subspan(1);
     bool by_command_line = takes_command_line({data, size});
     if (with.look == nullptr && rest.size() >= 2)

@@ -1,6 +1,7 @@
-"""Validates the SARIF logs of all sources that tests have, each alone and all together, and says how many there were.
+"""Validates the SARIF logs of all sources and images that tests have, the sources alone and together, and says how
+many logs there were.
 
-The first argument is where npm has put the validator, the second the program cdef.
+The first argument is where npm has put the validator, the second the program cdef, beside which the images are built.
 """
 
 import json
@@ -19,13 +20,17 @@ TOOL = "node_modules/@microsoft/sarif-multitool-linux"
 
 def logs(cdef, directory):
     """Write the logs; their paths."""
-    sources = sorted(path.name for path in CASES.glob("*.cdefsrc"))
-    groups = [[source] for source in sources] + [sources, [*sources[:3], "missing"], [str(CASES / sources[0])]]
+    images = cdef.parent / "tests/image"
+    sources, broken = (sorted(str(path.relative_to(place)) for path in place.rglob(pattern))
+                       for place, pattern in ((CASES, "*.cdefsrc"), (images, "*.cdef")))
+    groups = [("check", CASES, group) for group in
+              [[source] for source in sources] + [sources, [*sources[:3], "missing"], [str(CASES / sources[0])]]]
+    groups += [("verify", images, group) for group in (broken, [broken[0], "missing"], [str(images / broken[0])])]
     paths = []
-    for number, group in enumerate(groups):
+    for number, (subcommand, place, group) in enumerate(groups):
         paths.append(directory / f"{number}.sarif")
         with paths[-1].open("wb") as log:
-            subprocess.run([cdef, "check", "--format", "sarif", *group], cwd=CASES, stdout=log,
+            subprocess.run([cdef, subcommand, "--format", "sarif", *group], cwd=place, stdout=log,
                            stderr=subprocess.DEVNULL, check=False, timeout=60)
     return paths
 

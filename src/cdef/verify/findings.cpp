@@ -27,12 +27,16 @@ std::string place_of(const cdb::finding &f) {
     return place;
 }
 
+std::string sentence_of(const cdb::finding &f) {
+    std::string text = place_of(f);
+    text::appendf(text, " at offset %zu: %s: found %s, expected %s", f.offset, std::string(f.broken->title).c_str(),
+                  f.found.c_str(), f.expected.c_str());
+    return text;
+}
+
 std::string line_of(const std::string &file, const cdb::finding &f) {
-    std::string line;
-    text::appendf(line, "%s: %s: %s at offset %zu: %s: found %s, expected %s [%s]\n", text::escaped(file).c_str(),
-                  name_of(f.broken->level), place_of(f).c_str(), f.offset, std::string(f.broken->title).c_str(),
-                  f.found.c_str(), f.expected.c_str(), std::string(f.broken->code).c_str());
-    return line;
+    return text::escaped(file) + ": " + name_of(f.broken->level) + ": " + sentence_of(f) + " [" +
+           std::string(f.broken->code) + "]\n";
 }
 
 std::string json_value(const std::string &shown) {
@@ -60,11 +64,21 @@ std::vector<cdb::diagnosed> errors_of(std::vector<cdb::diagnosed> &&all) {
     return errors;
 }
 
+std::size_t consequences_of(const std::vector<cdb::diagnosed> &all, std::size_t cause) {
+    std::size_t next = cause + 1;
+    while (next < all.size() && all[next].cause != next)
+        ++next;
+    return next - cause - 1;
+}
+
+std::string count_of(std::size_t consequences) {
+    return consequences == 1 ? "1 finding follows from this one"
+                             : std::to_string(consequences) + " findings follow from this one";
+}
+
 std::string note_of(const std::string &file, std::size_t consequences) {
-    std::string note = text::escaped(file) + ": note: ";
-    if (consequences == 1)
-        return note + "1 finding follows from this one; --all shows it\n";
-    return note + std::to_string(consequences) + " findings follow from this one; --all shows them\n";
+    return text::escaped(file) + ": note: " + count_of(consequences) + "; --all shows " +
+           (consequences == 1 ? "it\n" : "them\n");
 }
 
 std::string note_of_many(const std::string &file, std::size_t count) {

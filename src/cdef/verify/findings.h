@@ -13,6 +13,15 @@ namespace cdef::verify {
 /* "section 2, rsrc_pattr_t 5, u_ra_name": as much of it as is known. */
 std::string place_of(const cdb::finding &f);
 
+/* "section 2, rsrc_pattr_t 5, u_ra_name at offset 8: wrong reference: found 5, expected 8" */
+std::string sentence_of(const cdb::finding &f);
+
+/* "1 finding follows from this one", or another number of them. */
+std::string count_of(std::size_t consequences);
+
+/* How many of the findings after a cause are its consequences. */
+std::size_t consequences_of(const std::vector<cdb::diagnosed> &all, std::size_t cause);
+
 /* One line, as compilers write them, with a newline. file: its name, with any bytes. */
 std::string line_of(const std::string &file, const cdb::finding &f);
 

@@ -6,7 +6,7 @@
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
 #include "cdef/verify/findings.h"
-#include "report/json_writer.h"
+#include "cdef/verify/forms.h"
 
 #include <CLI/CLI.hpp>
 
@@ -26,111 +26,16 @@ struct verify_options {
     bool shows_all = false;      /* consequences are shown too */
 };
 
-/* Shows what is found in each database. */
-class verify_form {
-public:
-    verify_form() = default;
-    verify_form(const verify_form &) = delete;
-    verify_form &operator=(const verify_form &) = delete;
-    virtual ~verify_form() = default;
-
-    virtual void begin_file(const std::string &name, bool sound) = 0;
-    virtual void add(const std::vector<cdb::diagnosed> &findings) = 0;
-    /* Instead, if there are so many that nobody looks for their causes: says so, and each is added by itself. */
-    virtual void begin_many(std::size_t count) = 0;
-    virtual void add_one(const cdb::finding &found) = 0;
-    virtual void end_file() = 0;
-    virtual void add_unreadable(const std::string &name, const std::string &why) = 0;
-    virtual void close() = 0;
-};
-
-/* Each cause with the number of its consequences, or with these. */
-class text_form : public verify_form {
-public:
-    explicit text_form(bool with_consequences) : shows_all(with_consequences) {}
-
-    void begin_file(const std::string &name, bool /* sound */) override {
-        file = name;
-    }
-    void add(const std::vector<cdb::diagnosed> &findings) override {
-        std::size_t hidden = 0;
-        for (std::size_t i = 0; i < findings.size(); ++i) {
-            bool follows = findings[i].cause != i;
-            hidden += follows && !shows_all;
-            if (!follows || shows_all)
-                out.text += (follows ? "  " : "") + verify::line_of(file, findings[i].found);
-            bool group_ends = i + 1 == findings.size() || findings[i + 1].cause == i + 1;
-            if (group_ends && hidden > 0)
-                out.text += verify::note_of(file, std::exchange(hidden, 0));
-            out.flush_if_full();
-        }
-    }
-    void begin_many(std::size_t count) override {
-        out.text += verify::note_of_many(file, count);
-    }
-    void add_one(const cdb::finding &found) override {
-        out.text += verify::line_of(file, found);
-        out.flush_if_full();
-    }
-    void end_file() override {}
-    void add_unreadable(const std::string & /* name */, const std::string & /* why */) override {}
-    void close() override {
-        out.flush();
-    }
-
-private:
-    bool shows_all;
-    std::string file;
-    output out;
-};
-
-class json_form : public verify_form {
-public:
-    json_form() : to(print) {
-        to.open_object();
-        to.add_schema("cdef-verify.schema.json", 1);
-        to.open_list("files");
-    }
-    void begin_file(const std::string &name, bool sound) override {
-        to.open_object();
-        to.add_text("file", name);
-        to.add_truth("sound", sound);
-    }
-    void add(const std::vector<cdb::diagnosed> &findings) override {
-        to.open_list("findings");
-        for (std::size_t i = 0; i < findings.size(); ++i)
-            verify::add_finding(to, findings[i], i);
-    }
-    void begin_many(std::size_t /* count */) override {
-        to.add_truth("diagnosed", false);
-        to.open_list("findings");
-    }
-    void add_one(const cdb::finding &found) override {
-        verify::add_finding(to, {found, 0}, 0);
-    }
-    void end_file() override {
-        to.close();
-        to.close();
-    }
-    void add_unreadable(const std::string &name, const std::string &why) override {
-        to.open_object();
-        to.add_text("file", name);
-        to.add_text("unreadable", why);
-        to.close();
-    }
-    void close() override {
-        to.close();
-        to.close();
-    }
-
-private:
-    report::json_writer to;
-};
-
-std::unique_ptr<verify_form> form_of(const verify_options &options) {
+std::unique_ptr<verify::form> form_of(const verify_options &options) {
     if (options.form == "json")
-        return std::make_unique<json_form>();
-    return std::make_unique<text_form>(options.shows_all);
+        return verify::json_form();
+    if (options.form == "sarif")
+        return verify::sarif_form();
+    if (options.form == "github")
+        return verify::github_form(options.shows_all);
+    if (options.form == "gitlab")
+        return verify::gitlab_form(options.shows_all);
+    return verify::text_form(options.shows_all);
 }
 
 constexpr std::size_t MOST_DIAGNOSED = 10000; /* findings of which the causes are looked for */
@@ -140,13 +45,13 @@ bool is_shown(const cdb::finding &found, const verify_options &options) {
 }
 
 void show_diagnosis(const cdb::database &db, std::vector<cdb::finding> &&found, const verify_options &options,
-                    verify_form &form) {
+                    verify::form &form) {
     std::vector<cdb::diagnosed> findings = cdb::diagnose(db, std::move(found));
     form.add(options.quiet ? verify::errors_of(std::move(findings)) : findings);
 }
 
 /* Verifies again, so that the findings are never in memory together. */
-void show_many(const cdb::database &db, std::size_t count, const verify_options &options, verify_form &form) {
+void show_many(const cdb::database &db, std::size_t count, const verify_options &options, verify::form &form) {
     form.begin_many(count);
     cdb::verify(db, [&](cdb::finding &&found) {
         if (is_shown(found, options))
@@ -155,7 +60,7 @@ void show_many(const cdb::database &db, std::size_t count, const verify_options 
 }
 
 /* Shows the findings in one file; whether it passes. */
-bool judge(const std::string &path, const verify_options &options, verify_form &form) {
+bool judge(const std::string &path, const verify_options &options, verify::form &form) {
     input in(path);
     if (is_text(in.contents))
         throw failure(path + ": a text, not a database; 'cdef check' checks sources");
@@ -171,7 +76,7 @@ bool judge(const std::string &path, const verify_options &options, verify_form &
 }
 
 int run(const verify_options &options) {
-    std::unique_ptr<verify_form> form = form_of(options);
+    std::unique_ptr<verify::form> form = form_of(options);
     bool pass = true;
     bool read = true;
     for (const std::string &file : options.files) {
@@ -194,7 +99,7 @@ void add_verify(CLI::App &app, int &status) {
     CLI::App *command =
         app.add_subcommand("verify", "Checks whether databases are sound; prints nothing about flawless ones");
     command->add_option("FILE", options->files, "Database to verify; - is standard input")->required();
-    add_forms(*command, options->form, {"text", "json"}, "Form of the findings: text or json");
+    add_forms(*command, options->form, {"text", "json", "sarif", "github", "gitlab"}, "Form of the findings");
     command->add_flag("--all", options->shows_all, "Show the findings that follow from others too");
     command->add_flag("--werror", options->warnings_count, "Count warnings as errors");
     command->add_flag("-q,--quiet", options->quiet, "Show errors only");

@@ -81,8 +81,6 @@ hi def link cdefString String
 hi def link cdefNumber Number
 hi def link cdefComment Comment
 
-syn sync match cdefSync grouphere NONE /^\\h/
-
 let b:current_syntax = "cdefsrc"
 '''
 
@@ -108,6 +106,12 @@ def vim_syntax(stanzas, words):
             f"contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttribute{stanza},{shared}"
         )
         lines.append(f"hi def link cdefAttribute{stanza} cdefAttribute")
+    # In the middle of a file, what is in force is found by the nearest header above: a known one begins its region.
+    known = r"\|".join(longest_first(stanzas))
+    lines.append("")
+    lines += [rf"syn sync match cdefSync{stanza} grouphere cdefIn{stanza} /^{stanza}\ze{VIM_AFTER_HEADER}/"
+              for stanza in stanzas]
+    lines.append(rf"syn sync match cdefSyncUnknown grouphere NONE /^\%(\%({known}\){VIM_AFTER_HEADER}\)\@!{VIM_HEADER}/")
     return "\n".join(lines) + "\n" + VIM_TAIL
 
 

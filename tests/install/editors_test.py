@@ -161,6 +161,23 @@ class Vim(Case):
             self.assertFalse(compiles(self.here, source.encode()), source)
             self.assertEqual(found, [mistake], source)
 
+    def test_resumes_in_the_middle_of_a_stanza(self):
+        """Lines that are asked for first, far from the top: as if the editor jumps there."""
+        stanza = ("PersistentResourceAttribute // x\n\tName=A\n\tDescription=1\n# comment\n\tReportingInterval=3\n"
+                  "\"\" # comment\n\tDataType=UInt32\n" + "\t# comment\n" * 100)
+        source = "ControlDefinition\n\tFileVersion=1.0.0.0\n" + stanza * 50 + "Unknown\n\tName=B\n" + "# c\n" * 300 + stanza
+        (self.here / "a.cdefsrc").write_text(source)
+        end, unknown = source.count("\n"), 2 + 107 * 50
+        said = self.ask("a.cdefsrc", f"""
+            for line in [{end}, {end - 100}, {end - 102}, {end - 104}, {end - 105}, {end - 106}, {unknown + 2},
+                \\ {unknown - 100}, {unknown - 102}]
+              call add(said, synIDattr(synID(line, 2, 1), 'name'))
+            endfor
+            """)
+        same = ["cdefAttributePersistentResourceAttribute", "cdefUnknownAttribute"]
+        self.assertEqual(said, ["cdefComment", *same, "cdefAttributePersistentResourceAttribute",
+                                "cdefAttributePersistentResourceAttribute", "cdefStanza", "", *same])
+
     def test_make_checks_the_file(self):
         (self.here / "a.cdefsrc").write_text(SOURCE)
         self.assertEqual(self.ask("a.cdefsrc", "call add(said, &makeprg)"), ["cdef check %:S"])

@@ -93,6 +93,27 @@ syn match cdefAttributeActionOutSDDefinition /^[ \t]\+\zs\%(ValueDisplayName\|De
 syn region cdefInActionOutSDDefinition matchgroup=cdefStanza start=/^ActionOutSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/ end=/^\ze\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/ contains=cdefUnknownAttribute,cdefNoAttribute,cdefAttributeActionOutSDDefinition,cdefComment,cdefString,cdefNumber,cdefType,cdefProperty
 hi def link cdefAttributeActionOutSDDefinition cdefAttribute
 
+syn sync match cdefSyncControlDefinition grouphere cdefInControlDefinition /^ControlDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncClassToManagerMapping grouphere cdefInClassToManagerMapping /^ClassToManagerMapping\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncResourceVariableClass grouphere cdefInResourceVariableClass /^ResourceVariableClass\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncResourceClass grouphere cdefInResourceClass /^ResourceClass\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncPersistentResourceAttribute grouphere cdefInPersistentResourceAttribute /^PersistentResourceAttribute\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncPersistentClassAttribute grouphere cdefInPersistentClassAttribute /^PersistentClassAttribute\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncDynamicResourceAttribute grouphere cdefInDynamicResourceAttribute /^DynamicResourceAttribute\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncDynamicClassAttribute grouphere cdefInDynamicClassAttribute /^DynamicClassAttribute\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncClassAction grouphere cdefInClassAction /^ClassAction\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncResourceAction grouphere cdefInResourceAction /^ResourceAction\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncPAttrSDDefinition grouphere cdefInPAttrSDDefinition /^PAttrSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncDAttrSDDefinition grouphere cdefInDAttrSDDefinition /^DAttrSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncDefineSDDefinition grouphere cdefInDefineSDDefinition /^DefineSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncUndefineSDDefinition grouphere cdefInUndefineSDDefinition /^UndefineSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncOnlineSDDefinition grouphere cdefInOnlineSDDefinition /^OnlineSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncOfflineSDDefinition grouphere cdefInOfflineSDDefinition /^OfflineSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncResetSDDefinition grouphere cdefInResetSDDefinition /^ResetSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncActionInSDDefinition grouphere cdefInActionInSDDefinition /^ActionInSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncActionOutSDDefinition grouphere cdefInActionOutSDDefinition /^ActionOutSDDefinition\ze\%([ \t#]\|\/[\/*]\|$\)/
+syn sync match cdefSyncUnknown grouphere NONE /^\%(\%(PersistentResourceAttribute\|DynamicResourceAttribute\|PersistentClassAttribute\|ActionOutSDDefinition\|ClassToManagerMapping\|DynamicClassAttribute\|ResourceVariableClass\|ActionInSDDefinition\|UndefineSDDefinition\|OfflineSDDefinition\|DefineSDDefinition\|OnlineSDDefinition\|ControlDefinition\|DAttrSDDefinition\|PAttrSDDefinition\|ResetSDDefinition\|ResourceAction\|ResourceClass\|ClassAction\)\%([ \t#]\|\/[\/*]\|$\)\)\@!\%(["\t ]*\%(#\|$\)\|[\t ]*\%("[\t ]*"[\t ]*\)*\/[\/*]\)\@![^ \t]/
+
 hi def link cdefUnknownStanza Error
 hi def link cdefUnknownAttribute Error
 hi def link cdefNoAttribute Error
@@ -103,7 +124,5 @@ hi def link cdefProperty Constant
 hi def link cdefString String
 hi def link cdefNumber Number
 hi def link cdefComment Comment
-
-syn sync match cdefSync grouphere NONE /^\h/
 
 let b:current_syntax = "cdefsrc"

@@ -6,7 +6,8 @@ import pytest
 
 from programs import PROGRAMS, TESTS, runner
 
-FUZZERS = ("source", "image", "cdef")
+FUZZERS = ("source", "image", "cdef", "format")
+SEEDS = {"format": "source"}  # of another fuzzer
 FOUND = [what for what in FUZZERS if any((TESTS / "fuzz/found" / what).glob("*"))]
 
 
@@ -22,7 +23,7 @@ def replay(what, directory):
 @pytest.mark.parametrize("what", FUZZERS)
 def test_seeds(what):
     """Golden sources, their databases, pairs of these, and generated ones."""
-    replay(what, PROGRAMS.build / "tests/fuzz/seeds" / what)
+    replay(what, PROGRAMS.build / "tests/fuzz/seeds" / SEEDS.get(what, what))
 
 
 @pytest.mark.parametrize("what", FOUND)

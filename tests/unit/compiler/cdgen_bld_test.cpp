@@ -5,6 +5,7 @@
 
 #include "compiler/staged_image.h"
 
+#include <cstdint>
 #include <sys/mman.h>
 
 namespace {
@@ -146,6 +147,7 @@ TEST_F(ImageSize, MoreThan65535RecordsOfOneKindAreRefused) {
     }
 }
 
+#if SIZE_MAX > UINT32_MAX /* a machine of 32 bits has no such tables */
 /* Address space for tables that are too large to exist. Whoever uses it takes it back from the table. */
 class vast_table {
 public:
@@ -188,6 +190,8 @@ TEST_F(ImageSize, ImageOrTableOfMoreThan32BitsIsRefused) {
     strings.hold(0x100000001);
     EXPECT_EQ(fatal_message([this] { cdb_size(cx); }), refused);
 }
+#endif
+
 /* ---- Sections -------------------------------------------------------------------------------------------------- */
 
 /* Writers that fill a buffer: sections follow the anchors, with two of them from 112 on. */

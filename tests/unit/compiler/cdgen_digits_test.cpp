@@ -46,7 +46,7 @@ TEST(Digits, TheNumberThatTheCLibraryReads) {
     std::mt19937_64 random(1);
     for (int i = 0; i < 100000; ++i) {
         std::string text = std::to_string(random());
-        text.resize(1 + random() % std::min(text.size(), MOST_DIGITS));
+        text.resize(1 + static_cast<size_t>(random() % std::min(text.size(), MOST_DIGITS)));
         EXPECT_EQ(number(text), strtoull(text.c_str(), nullptr, 10)) << text;
     }
 }

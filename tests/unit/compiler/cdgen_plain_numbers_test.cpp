@@ -63,11 +63,16 @@ TEST(PlainFraction, HasTheLibrarysBits) {
         expect_library_bits(text);
 }
 
+/* A number below count, which is not 0. */
+size_t below(size_t count, std::mt19937_64 &random) {
+    return static_cast<size_t>(random() % count);
+}
+
 TEST(PlainFraction, HasTheLibrarysBitsAnywhere) {
     std::mt19937_64 random(1);
     for (int i = 0; i < 20000; ++i) {
         std::string text = std::to_string(random() >> (random() % 64));
-        text.insert(text.size() - random() % (text.size() < 9 ? text.size() : 9), ".");
+        text.insert(text.size() - below(text.size() < 9 ? text.size() : 9, random), ".");
         expect_library_bits((random() % 2 != 0 ? "-" : "") + (text[0] == '.' ? "0" + text : text));
     }
 }
@@ -100,7 +105,7 @@ template <class Float> outcome by_the_compiler(const std::string &text, vx_data_
 
 std::string digits(std::mt19937_64 &random, size_t most) {
     std::string text;
-    for (size_t count = random() % (most + 1); count > 0; --count)
+    for (size_t count = below(most + 1, random); count > 0; --count)
         text += static_cast<char>('0' + random() % 10);
     return text;
 }
@@ -134,9 +139,9 @@ std::string any_number(std::mt19937_64 &random) {
     default:
         break;
     }
-    std::string text = (random() % 4 == 0 ? "-" : "") + digits(random, random() % 30);
+    std::string text = (random() % 4 == 0 ? "-" : "") + digits(random, below(30, random));
     if (random() % 2 == 0)
-        text += "." + digits(random, random() % 30);
+        text += "." + digits(random, below(30, random));
     constexpr const char *EXPONENTS[] = {"", "", "e", "E-", "e+", "p", "x"};
     const char *exponent = EXPONENTS[random() % std::size(EXPONENTS)];
     return *exponent == '\0' ? text : text + exponent + digits(random, 3);
@@ -148,7 +153,7 @@ std::string any_text(std::mt19937_64 &random) {
         return WORDS[random() % std::size(WORDS)];
     std::string text = any_number(random);
     if (random() % 20 == 0)
-        text.insert(random() % (text.size() + 1), 1, "+- .e0x,\t1"[random() % 10]);
+        text.insert(below(text.size() + 1, random), 1, "+- .e0x,\t1"[random() % 10]);
     return text;
 }
 

@@ -23,8 +23,8 @@ using namespace util_test;
 
 namespace {
 
-constexpr size_t ABSURD =
-    size_t{1} << 62; /* bytes that no machine has, and a power of 2 as single precision wants it */
+/* Bytes that no process can have beside its own, and a power of 2 as single precision wants it. */
+constexpr size_t ABSURD = size_t{1} << (sizeof(size_t) > 4 ? 62 : 31);
 
 /* Memory comes dirty, so that a byte that nobody zeroes shows. */
 class Tables : public testing::Test {

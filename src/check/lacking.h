@@ -8,7 +8,7 @@
 namespace check {
 
 /* The required attributes that the current stanza lacks at its end and that the compiler does not ask for. Nothing if
- * an error of the stanza has been reported, or will be. */
+ * an error of the stanza that has been reported, or will be, may explain it. */
 language::name_list lacking_unnoticed(const view &see, int next_kind);
 
 } // namespace check

@@ -183,7 +183,9 @@ constexpr row rows[] = {
       "Add the other one, or remove this one."},
      make_unbalanced},
     {{INCOMPLETE, "S515", "incomplete", "a stanza lacks required attributes",
-      "A stanza lacks required attributes, which the compiler does not notice: their fields are 0.", "Add them."},
+      "A stanza lacks required attributes, which the compiler does not notice: their fields are 0. If an error in the "
+      "stanza may be about the missing line, only the error is reported.",
+      "Add them."},
      make_incomplete},
     {{SD_WITHOUT_RUN, "S502", "sd-without-run", "an SD-typed attribute has no elements",
       "An attribute of type `SD` or `SDArray` is not directly followed by its elements.",

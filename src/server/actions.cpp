@@ -60,7 +60,6 @@ private:
         position_maker positions = in.positions(now.client.units);
         return text_edit(positions, at, by);
     }
-    json change(const finding_places &places, const check::edit &made) const;
     void add_corrections();
     void add_missing_lines();
     void add_free_number();
@@ -73,25 +72,6 @@ private:
     stretch part;
     json all = json::array();
 };
-
-/* A position cannot be between a carriage return and a newline: the edit then covers both. */
-json collector::change(const finding_places &places, const check::edit &made) const {
-    std::string_view source = in.text();
-    auto splits = [&](std::size_t at) {
-        return at > 0 && at < source.size() && source[at - 1] == '\r' && source[at] == '\n';
-    };
-    stretch at = places.of(made);
-    std::string text = made.text;
-    if (splits(at.end)) {
-        ++at.end;
-        text += '\n';
-    }
-    if (splits(at.begin)) {
-        --at.begin;
-        text.insert(0, "\r");
-    }
-    return edit(at, text);
-}
 
 std::string title_of(const check::finding &found) {
     const std::vector<check::edit> &edits = found.fix.edits;
@@ -111,14 +91,14 @@ std::string title_of(const check::finding &found) {
 /* Every correction that a finding in the range carries. */
 void collector::add_corrections() {
     finding_places places(in.text());
-    const std::vector<check::finding> &findings = in.findings(now.wanted);
+    const std::vector<check::finding> &findings = in.findings(now.settings.wanted_in(in.uri()));
     for (const check::finding &each : findings) {
         stretch at = places.of(each.at);
         if (each.fix.edits.empty() || at.begin > part.end || at.end < part.begin)
             continue;
         json edits = json::array();
         for (const check::edit &made : each.fix.edits)
-            edits.push_back(change(places, made));
+            edits.push_back(byte_edit(in, now.client.units, places.of(made), made.text));
         json &action = add(title_of(each), QUICK_FIX, std::move(edits));
         action["diagnostics"] = diagnostics_of(in.text(), in.lines(), in.uri(), {&each, 1}, now.form());
         if (each.fix.sure == check::certainty::certain)
@@ -202,7 +182,7 @@ difference difference_of(std::string_view before, std::string_view after) {
 
 void collector::add_all_corrections() {
     const std::string &before = in.text();
-    check::fixed_source fixed = check::fix_bytes(before, "source", now.wanted);
+    check::fixed_source fixed = check::fix_bytes(before, "source", now.settings.wanted_in(in.uri()));
     if (fixed.text == before)
         return;
     difference made = difference_of(before, fixed.text);

@@ -41,6 +41,23 @@ json workspace_edit(const session &now, const document &of, json edits) {
     return {{"documentChanges", json::array({{{"textDocument", std::move(document)}, {"edits", std::move(edits)}}})}};
 }
 
+json byte_edit(const document &in, encoding units, stretch part, std::string by) {
+    const std::string &source = in.text();
+    auto splits = [&](std::size_t at) {
+        return at > 0 && at < source.size() && source[at - 1] == '\r' && source[at] == '\n';
+    };
+    if (splits(part.end)) {
+        ++part.end;
+        by += '\n';
+    }
+    if (splits(part.begin)) {
+        --part.begin;
+        by.insert(0, "\r");
+    }
+    position_maker positions = in.positions(units);
+    return text_edit(positions, part, by);
+}
+
 json text_edit(position_maker &positions, const stretch &part, std::string_view by) {
     return {{"range", to_json(positions.of(part))}, {"newText", by}};
 }

@@ -33,6 +33,9 @@ json location_of(const session &now, document &in, const stretch &part);
 
 /* A workspace edit of one document, whose edits are these. */
 json workspace_edit(const session &now, const document &of, json edits);
+/* An edit of bytes. A position cannot be between a carriage return and a newline: where the bytes begin or end there,
+ * the edit covers both. */
+json byte_edit(const document &in, encoding units, stretch part, std::string by);
 json text_edit(position_maker &positions, const stretch &part, std::string_view by);
 
 } // namespace lsp

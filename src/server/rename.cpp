@@ -123,7 +123,8 @@ json rename(session &now, const json &params) {
     document after(place.in.uri(), 0, replaced(place.text(), all));
     if (!have_same_structure(place.in.names(), after.names()))
         throw request_error(REQUEST_FAILED, "something else would have the name " + language::quoted(name));
-    if (const check::finding *wrong = new_finding(place.in.findings(now.wanted), after.findings(now.wanted)))
+    const check::warning_set &wanted = now.settings.wanted_in(place.in.uri());
+    if (const check::finding *wrong = new_finding(place.in.findings(wanted), after.findings(wanted)))
         throw request_error(REQUEST_FAILED, std::string(wrong->code) + ": " + wrong->text);
     json edits = json::array();
     position_maker positions = place.in.positions(now.client.units);

@@ -4,9 +4,13 @@
 
 #include "server/actions.h"
 #include "server/completion.h"
+#include "server/folders.h"
 #include "server/folding.h"
+#include "server/formatting.h"
 #include "server/hover.h"
 #include "server/navigation.h"
+#include "server/publishing.h"
+#include "server/pulling.h"
 #include "server/rename.h"
 #include "server/symbols.h"
 #include "server/synchronisation.h"
@@ -28,6 +32,11 @@ struct request_row {
 
 constexpr std::array requests = {
     request_row{"textDocument/hover", hover},
+    request_row{"textDocument/diagnostic", document_diagnostic},
+    request_row{"workspace/diagnostic", workspace_diagnostic},
+    request_row{"workspace/symbol", workspace_symbols},
+    request_row{"textDocument/formatting", format_document},
+    request_row{"textDocument/rangeFormatting", format_range},
     request_row{"textDocument/completion", completion},
     request_row{"textDocument/definition", definition},
     request_row{"textDocument/references", references},
@@ -50,23 +59,36 @@ constexpr std::array notifications = {
     notification_row{"textDocument/didOpen", did_open},
     notification_row{"textDocument/didChange", did_change},
     notification_row{"textDocument/didClose", did_close},
+    notification_row{"workspace/didChangeWorkspaceFolders", did_change_folders},
+    notification_row{"workspace/didChangeWatchedFiles", did_change_files},
+    notification_row{"workspace/didChangeConfiguration", did_change_settings},
+    notification_row{"window/workDoneProgress/cancel", did_cancel_progress},
 };
 
 /* What the server offers to a client. */
 json offers_to(const client_abilities &client) {
     constexpr int INCREMENTAL = 2;
-    return {{"positionEncoding", client.units == encoding::utf8 ? "utf-8" : "utf-16"},
-            {"textDocumentSync", {{"openClose", true}, {"change", INCREMENTAL}, {"save", false}}},
-            {"hoverProvider", true},
-            {"completionProvider", {{"triggerCharacters", {"=", ",", "."}}}},
-            {"definitionProvider", true},
-            {"referencesProvider", true},
-            {"documentHighlightProvider", true},
-            {"documentSymbolProvider", true},
-            {"foldingRangeProvider", true},
-            {"semanticTokensProvider", {{"legend", token_legend()}, {"full", true}, {"range", true}}},
-            {"renameProvider", {{"prepareProvider", true}}},
-            {"codeActionProvider", {{"codeActionKinds", {"quickfix", "refactor.rewrite", "source.fixAll.cdef"}}}}};
+    json offers = {
+        {"positionEncoding", client.units == encoding::utf8 ? "utf-8" : "utf-16"},
+        {"textDocumentSync", {{"openClose", true}, {"change", INCREMENTAL}, {"save", false}}},
+        {"hoverProvider", true},
+        {"completionProvider", {{"triggerCharacters", {"=", ",", "."}}}},
+        {"definitionProvider", true},
+        {"referencesProvider", true},
+        {"documentHighlightProvider", true},
+        {"documentSymbolProvider", true},
+        {"foldingRangeProvider", true},
+        {"semanticTokensProvider", {{"legend", token_legend()}, {"full", true}, {"range", true}}},
+        {"renameProvider", {{"prepareProvider", true}}},
+        {"codeActionProvider", {{"codeActionKinds", {"quickfix", "refactor.rewrite", "source.fixAll.cdef"}}}},
+        {"documentFormattingProvider", true},
+        {"documentRangeFormattingProvider", true},
+        {"workspaceSymbolProvider", true},
+        {"workspace", {{"workspaceFolders", {{"supported", true}, {"changeNotifications", true}}}}}};
+    if (client.pulls)
+        offers["diagnosticProvider"] = {
+            {"identifier", "cdef"}, {"interFileDependencies", true}, {"workspaceDiagnostics", true}};
+    return offers;
 }
 
 const json *method_of(const json &message) {
@@ -126,16 +148,31 @@ void server::cancel(const json &params) {
 }
 
 bool server::has_work() const {
-    return !status && (!waiting.empty() || (state == phase::initialized && !now.unpublished.empty()));
+    return !status &&
+           (!waiting.empty() || (state == phase::initialized && (!now.unpublished.empty() || now.sources.has_work())));
 }
 
 void server::work() {
-    if (waiting.empty())
-        return publish_next(now);
+    if (waiting.empty()) {
+        if (now.unpublished.empty())
+            now.sources.step(now);
+        else
+            publish_next(now);
+        return finish_step();
+    }
     waiting_message message = std::move(waiting.front());
     waiting.pop_front();
     waiting_bytes -= message.size;
     handle(message);
+}
+
+/* When everything has been looked at, a client that asks for findings is told to ask again. */
+void server::finish_step() {
+    publish_problems(now);
+    if (now.asks_again && !has_work()) {
+        now.asks_again = false;
+        now.ask("workspace/diagnostic/refresh", nullptr);
+    }
 }
 
 /* A response answers a request of the server, none of which needs its answer. */
@@ -193,6 +230,7 @@ json server::initialize(const json &params) {
     now.client = abilities_in(params);
     if (const json *id = optional_member(params, "processId"); id != nullptr && id->is_number_integer())
         process = id->get<int>();
+    folders = folders_in(params);
     state = phase::initialized;
     return {{"capabilities", offers_to(now.client)},
             {"serverInfo", {{"name", "cdef"}, {"version", now.world.version}}}};
@@ -208,6 +246,8 @@ void server::handle_notification(const json &message) {
     if (state != phase::initialized)
         return;
     try {
+        if (method == "initialized")
+            begin_watching(now, std::exchange(folders, {}));
         for (const notification_row &each : notifications)
             if (each.method == method)
                 each.take(now, params_of(message));

@@ -57,6 +57,7 @@ private:
     void handle_notification(const json &message);
     json answer(const std::string &method, const json &params);
     json initialize(const json &params);
+    void finish_step();
     void cancel(const json &params);
     void refuse(const json &id, error_code code, std::string_view text);
 
@@ -66,6 +67,7 @@ private:
     std::size_t waiting_bytes = 0;
     std::optional<int> status;
     std::optional<int> process;
+    std::vector<std::string> folders; /* that the client begins with */
 };
 
 } // namespace lsp

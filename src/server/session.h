@@ -5,7 +5,9 @@
 #include "check/check.h"
 #include "server/diagnostics.h"
 #include "server/document.h"
+#include "server/projects.h"
 #include "server/rpc.h"
+#include "server/workspace.h"
 
 #include <functional>
 #include <map>
@@ -30,8 +32,9 @@ struct surroundings {
     std::function<std::optional<std::string>(const std::string &path)> read;
     /* The sources in a folder and the folders in it, as paths, in order. */
     std::function<std::vector<std::string>(const std::string &folder)> sources_in;
-    std::string explanations; /* where the page about all codes is, a URI; empty: nowhere */
-    std::string version;      /* of the program */
+    std::string explanations;                     /* where the page about all codes is, a URI; empty: nowhere */
+    std::string version;                          /* of the program */
+    std::optional<std::string> project_file = {}; /* read in place of all others; empty: none is read */
     /* The text of a message. Empty as long as nothing reads catalogs. */
     std::function<std::optional<std::string>(const message_number &)> message_text = {};
 };
@@ -55,7 +58,7 @@ client_abilities abilities_in(const json &initialize);
 
 struct session {
     explicit session(surroundings machine) : world(std::move(machine)) {
-        wanted.fill(true);
+        settings.only = world.project_file;
     }
 
     diagnostic_form form() const {
@@ -64,15 +67,22 @@ struct session {
     void send(json message) {
         outbox.push_back(std::move(message));
     }
+    /* Sends a request of the server, whose answer does not matter. */
+    void ask(std::string_view method, json params) {
+        send(request("cdef/" + std::to_string(++asked), method, std::move(params)));
+    }
     /* The open document that the parameters of a request name. Throws request_error. */
     document &document_in(const json &params);
 
     surroundings world;
     client_abilities client;
-    check::warning_set wanted;
+    projects settings;
+    workspace sources;
     std::map<std::string, document> open; /* by key_of their URIs */
     std::set<std::string> unpublished;    /* keys of open documents that changed since their findings were sent */
     std::vector<json> outbox;
+    unsigned asked = 0;      /* requests of the server */
+    bool asks_again = false; /* the client is to ask for findings again */
 };
 
 } // namespace lsp

@@ -2,17 +2,17 @@
 
 #include "server/synchronisation.h"
 
+#include "server/publishing.h"
 #include "server/uris.h"
 
 namespace lsp {
 
 namespace {
 
-void publish(session &now, const std::string &uri, const json &version, json diagnostics) {
-    json params = {{"uri", uri}, {"diagnostics", std::move(diagnostics)}};
-    if (!version.is_null())
-        params["version"] = version;
-    now.send(notification("textDocument/publishDiagnostics", std::move(params)));
+/* What the disk has of it, or had, may count anew. */
+void look_at_file(session &now, const std::string &key) {
+    if (now.sources.holds(key) || (now.sources.is_in_folder(key) && key.ends_with(".cdefsrc")))
+        now.sources.look_at(key);
 }
 
 } // namespace
@@ -43,16 +43,21 @@ void did_change(session &now, const json &params) {
 
 void did_close(session &now, const json &params) {
     std::string uri = now.document_in(params).uri();
-    now.open.erase(key_of(uri));
-    now.unpublished.erase(key_of(uri));
-    publish(now, uri, nullptr, json::array());
+    std::string key = key_of(uri);
+    now.open.erase(key);
+    now.unpublished.erase(key);
+    if (now.sources.is_in_folder(key))
+        return look_at_file(now, key);
+    if (!now.client.pulls)
+        now.send(notification("textDocument/publishDiagnostics", {{"uri", uri}, {"diagnostics", json::array()}}));
 }
 
 void publish_next(session &now) {
-    document &changed = now.open.at(*now.unpublished.begin());
+    std::string key = *now.unpublished.begin();
     now.unpublished.erase(now.unpublished.begin());
-    publish(now, changed.uri(), changed.version(),
-            diagnostics_of(changed.text(), changed.lines(), changed.uri(), changed.findings(now.wanted), now.form()));
+    if (!now.client.pulls)
+        publish(now, now.open.at(key).uri());
+    look_at_file(now, key);
 }
 
 } // namespace lsp

@@ -10,7 +10,7 @@ void did_open(session &now, const json &params);
 void did_change(session &now, const json &params);
 void did_close(session &now, const json &params);
 
-/* Sends the findings of one document that has changed; there must be one. */
+/* Sends the findings of one document that has changed; there must be one. A client that asks for them gets none. */
 void publish_next(session &now);
 
 } // namespace lsp

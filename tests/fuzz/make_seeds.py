@@ -3,11 +3,13 @@
 DIRECTORY/source gets the golden sources and generated ones, each behind a byte
 of options; DIRECTORY/image what cdgen makes of them, in both byte orders, and
 the images of tests/image; DIRECTORY/cdef all of these, behind a byte that says
-what is done with them; DIRECTORY/source.dict the words of the language, as the
+what is done with them; DIRECTORY/lsp conversations with the language server;
+DIRECTORY/source.dict the words of the language, as the
 compiler's own catalogue has them.
 """
 
 import argparse
+import json
 import os
 import pathlib
 import subprocess
@@ -67,6 +69,41 @@ def write_cdef_seeds(directory):
             (seeds / f"pair-{number}").write_bytes(bytes([form]) + pair)
 
 
+def conversation(text, line, character):
+    """Messages about a source, with a request of each kind about a place in it."""
+    about = {"textDocument": {"uri": "file:///a.cdefsrc"}}
+    place = {"line": line, "character": character}
+    whole = {"start": {"line": 0, "character": 0}, "end": {"line": line + 9, "character": 0}}
+    yield "textDocument/didOpen", {"textDocument": {"uri": "file:///a.cdefsrc", "languageId": "cdefsrc", "version": 1,
+                                                    "text": text.decode(errors="replace")}}
+    for method in ("hover", "completion", "definition", "references", "documentHighlight", "prepareRename"):
+        yield f"textDocument/{method}", {**about, "position": place, "context": {"includeDeclaration": True}}
+    yield "textDocument/rename", {**about, "position": place, "newName": "New"}
+    yield "textDocument/codeAction", {**about, "range": whole, "context": {"diagnostics": []}}
+    for method in ("documentSymbol", "foldingRange", "semanticTokens/full", "diagnostic", "formatting"):
+        yield f"textDocument/{method}", about
+    yield "textDocument/rangeFormatting", {**about, "range": whole}
+    yield "workspace/symbol", {"query": "a"}
+    yield "textDocument/didChange", {"textDocument": {**about["textDocument"], "version": 2}, "contentChanges": [
+        {"range": {"start": place, "end": place}, "text": "\n\tId=1"}]}
+    yield "textDocument/didClose", about
+    yield "shutdown", {}
+
+
+def write_lsp_seeds(directory):
+    """Conversations about small sources, as bodies and as a stream."""
+    texts = [text for text in sources() if len(text) < 1500]
+    for number, text in enumerate(texts):
+        place = number % (text.count(b"\n") + 1), number % 20
+        bodies = [json.dumps({"jsonrpc": "2.0", "method": method, "params": params,
+                              **({} if method.split("/")[-1].startswith("did") else {"id": count})}).encode()
+                  for count, (method, params) in enumerate(conversation(text, *place))]
+        (directory / "lsp" / f"bodies-{number}").write_bytes(b"\0" + b"\0".join(bodies))
+    initialize = b'{"jsonrpc":"2.0","id":1,"method":"initialize","params":{"capabilities":{}}}'
+    stream = b"".join(b"Content-Length: %d\r\n\r\n%s" % (len(body), body) for body in (initialize, *bodies))
+    (directory / "lsp" / "stream").write_bytes(b"\1" + stream)
+
+
 def escaped(word):
     """A dictionary entry."""
     text = "".join(c if c.isalnum() or c in "=,._-" else f"\\x{ord(c):02x}" for c in word)
@@ -98,7 +135,7 @@ def main():
     parser.add_argument("directory", type=pathlib.Path)
     options = parser.parse_args()
     runner = [word for word in options.runner.split(";") if word]
-    for name in ("source", "image", "cdef"):
+    for name in ("source", "image", "cdef", "lsp"):
         (options.directory / name).mkdir(parents=True, exist_ok=True)
     for number, text in enumerate(sources()):
         option = OPTIONS[number % len(OPTIONS)]
@@ -107,6 +144,7 @@ def main():
     command = [sys.executable, "-B", TESTS / "support" / "make_images.py", "--out", options.directory / "image"]
     subprocess.run(command, check=True)
     write_cdef_seeds(options.directory)
+    write_lsp_seeds(options.directory)
     dictionary = sorted({escaped(word) for word in words([*runner, options.list_names.resolve()])})
     (options.directory / "source.dict").write_text("".join(dictionary))
 

@@ -6,7 +6,7 @@ import pytest
 
 from programs import PROGRAMS, TESTS, runner
 
-FUZZERS = ("source", "image", "cdef", "format")
+FUZZERS = ("source", "image", "cdef", "format", "lsp")
 SEEDS = {"format": "source"}  # of another fuzzer
 FOUND = [what for what in FUZZERS if any((TESTS / "fuzz/found" / what).glob("*"))]
 

@@ -4,6 +4,7 @@
 #include "cdef/lsp/files.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/output.h"
+#include "cdef/support/project_files.h"
 #include "cdef/support/status.h"
 #include "server/framing.h"
 #include "server/server.h"
@@ -27,6 +28,7 @@ namespace {
 struct lsp_options {
     bool standard_streams = false; /* accepted, since clients pass it; there is no other way */
     std::string explanations;
+    project_options project;
 };
 
 /* The server between two streams of bytes. */
@@ -36,7 +38,8 @@ public:
         : server({.read = bytes_of_file,
                   .sources_in = sources_below,
                   .explanations = options.explanations.empty() ? explanations_page() : options.explanations,
-                  .version = CDGEN_VERSION}) {}
+                  .version = CDGEN_VERSION,
+                  .project_file = options.project.none ? "" : options.project.file}) {}
 
     int serve();
 
@@ -112,6 +115,7 @@ void add_lsp(CLI::App &app, int &status) {
     command->add_flag("--stdio", options->standard_streams, "Ignored: there is no other way to connect");
     command->add_option("--explanations", options->explanations,
                         "URI of the page that explains the codes, instead of the installed one");
+    add_project_options(*command, options->project);
     command->footer(status_help("lsp"));
     command->callback([options, &status] { status = connection(*options).serve(); });
 }

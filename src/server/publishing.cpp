@@ -1,0 +1,84 @@
+/* publishing.cpp: findings on their way to the client. */
+
+#include "server/publishing.h"
+
+#include "report/places.h"
+#include "server/uris.h"
+#include "text/utf8.h"
+
+#include <optional>
+
+namespace lsp {
+
+namespace {
+
+/* The findings of a text, those of its own before those that other classes cause. */
+json diagnostics_in(session &now, const std::string &uri, const document &in, std::vector<check::finding> findings) {
+    std::vector<check::finding> across = now.sources.across(key_of(uri));
+    findings.insert(findings.end(), across.begin(), across.end());
+    return diagnostics_of(in.text(), in.lines(), uri, findings, now.form());
+}
+
+/* A line counts from 0, or is the first one; a column counts characters. */
+json problem_diagnostic(const config::problem &what, const document &in, encoding units) {
+    std::size_t line = what.line > 0 ? static_cast<std::size_t>(what.line) - 1 : 0;
+    stretch part;
+    if (line < in.lines().count()) {
+        part = in.lines().line(in.text(), line);
+        std::string_view rest = part.of(in.text());
+        for (int column = 1; column < what.column && !rest.empty(); ++column)
+            rest.remove_prefix(text::length_or_1(rest));
+        part.begin = part.end - rest.size();
+    }
+    constexpr int ERROR = 1;
+    return {{"range", to_json(in.positions(units).of(part))},
+            {"severity", ERROR},
+            {"source", "cdef"},
+            {"message", what.text}};
+}
+
+} // namespace
+
+report_of_document report_on(session &now, const std::string &uri) {
+    auto open = now.open.find(key_of(uri));
+    if (open != now.open.end()) {
+        document &in = open->second;
+        return {in.version(), diagnostics_in(now, in.uri(), in, in.findings(now.settings.wanted_in(uri)))};
+    }
+    std::optional<std::string> path = path_of(uri);
+    std::optional<std::string> text = path ? now.world.read(*path) : std::nullopt;
+    if (!text)
+        return {};
+    auto known = now.sources.files().find(*path);
+    document stored(uri, 0, std::move(*text));
+    bool is_known = known != now.sources.files().end();
+    return {nullptr, diagnostics_in(now, uri, stored,
+                                    is_known ? known->second.own : stored.findings(now.settings.wanted_in(uri)))};
+}
+
+void publish(session &now, const std::string &uri) {
+    if (now.client.pulls) {
+        now.asks_again = now.client.refreshes;
+        return;
+    }
+    report_of_document found = report_on(now, uri);
+    json params = {{"uri", uri}, {"diagnostics", std::move(found.diagnostics)}};
+    if (auto open = now.open.find(key_of(uri)); open != now.open.end())
+        params["uri"] = open->second.uri();
+    if (!found.version.is_null())
+        params["version"] = std::move(found.version);
+    now.send(notification("textDocument/publishDiagnostics", std::move(params)));
+}
+
+void publish_problems(session &now) {
+    for (const auto &[path, problems] : now.settings.take_problems()) {
+        document file(report::uri_of(path), 0, now.world.read(path).value_or(""));
+        json all = json::array();
+        for (const config::problem &each : problems)
+            all.push_back(problem_diagnostic(each, file, now.client.units));
+        now.send(
+            notification("textDocument/publishDiagnostics", {{"uri", file.uri()}, {"diagnostics", std::move(all)}}));
+    }
+}
+
+} // namespace lsp

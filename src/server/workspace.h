@@ -1,0 +1,78 @@
+/* workspace.h: the sources in the client's folders: all are checked, and compared as classes that are built together.
+ */
+#ifndef CDGEN_SERVER_WORKSPACE_H
+#define CDGEN_SERVER_WORKSPACE_H
+
+#include "build/across.h"
+#include "check/check.h"
+
+#include <cstddef>
+#include <map>
+#include <optional>
+#include <set>
+#include <string>
+#include <vector>
+
+namespace lsp {
+
+struct session;
+
+/* A source in a folder. */
+struct workspace_file {
+    std::vector<check::finding>
+        own; /* what is wrong with it as it is stored. Of an open document that counts instead */
+    std::vector<check::finding> across;      /* what contradicts other classes */
+    std::optional<build::class_facts> facts; /* none: it has errors, or has not been checked yet */
+};
+
+class workspace {
+public:
+    /* By path. */
+    const std::map<std::string, workspace_file> &files() const {
+        return known;
+    }
+    bool holds(const std::string &path) const {
+        return known.contains(path);
+    }
+    /* What contradicts other classes in a source; nothing in one that is in no folder. */
+    std::vector<check::finding> across(const std::string &path) const {
+        auto found = known.find(path);
+        return found == known.end() ? std::vector<check::finding>() : found->second.across;
+    }
+
+    /* Folders come and go; their sources are looked at step by step. */
+    void add_folder(session &now, const std::string &path);
+    void remove_folder(session &now, const std::string &path);
+    /* A source in a folder has changed, in the editor or on the disk, has come or has gone. */
+    void look_at(const std::string &path) {
+        waiting.insert(path);
+    }
+    void look_at_all();
+    bool is_in_folder(const std::string &path) const;
+
+    bool has_work() const {
+        return !waiting.empty() || uncompared;
+    }
+    /* Looks at one source, or compares all. */
+    void step(session &now);
+
+    /* The client does not want to wait for the rest of the first look. */
+    void stop_scan(session &now);
+
+private:
+    void check(session &now, const std::string &path);
+    void compare(session &now);
+    void begin_progress(session &now);
+    void report_progress(session &now);
+
+    std::set<std::string> folders; /* each with a slash at its end */
+    std::map<std::string, workspace_file> known;
+    std::set<std::string> waiting; /* sources to be looked at */
+    bool uncompared = false;       /* facts have changed since the classes were compared */
+    bool in_progress = false;      /* the client has been told of a first look that has not ended */
+    std::size_t scan_size = 0;     /* sources of the first look */
+};
+
+} // namespace lsp
+
+#endif

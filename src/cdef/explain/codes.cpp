@@ -4,6 +4,8 @@
 
 #include "cdb_view.h"
 #include "check/check.h"
+#include "compare/rules.h"
+#include "gate/ids.h"
 #include "language/messages.h"
 #include "reader/diagnosis.h"
 
@@ -27,7 +29,25 @@ bool by_code(const explanation &a, const explanation &b) {
 
 explanation explained(const cdb::rule &row) {
     const char *severity = row.level == cdb::severity::error ? "error" : "warning";
-    return {row.code, severity, {}, row.title, row.cause, row.cure, nullptr};
+    return {row.code, severity, {}, row.title, std::string(row.cause), std::string(row.cure), nullptr};
+}
+
+explanation explained(const compare::breach_rule &row) {
+    return {
+        row.code,
+        "error",
+        {},
+        row.title,
+        "Whoever relies on the older version is affected: " + std::string(row.reason) + ". It counts at the level `" +
+            std::string(compare::name_of(row.broken_for)) + "` and those after it.",
+        "Take the change back, or add something new beside what was there. If nobody relies on the older version in "
+        "this way, choose a level before this one.",
+        nullptr};
+}
+
+explanation explained(const gate::ids_rule &row) {
+    const char *severity = row.name.empty() ? "error" : "warning";
+    return {row.code, severity, row.name, row.title, std::string(row.cause), std::string(row.cure), nullptr};
 }
 
 } // namespace
@@ -43,6 +63,10 @@ std::vector<explanation> explanations() {
     for (const cdb::rule &row : cdb::rules())
         all.push_back(explained(row));
     all.push_back(explained(cdb::contradicting_rule()));
+    for (const compare::breach_rule &row : compare::breach_rules())
+        all.push_back(explained(row));
+    for (const gate::ids_rule &row : gate::ids_rules())
+        all.push_back(explained(row));
     std::sort(all.begin() + first_of_databases, all.end(), by_code);
     return all;
 }

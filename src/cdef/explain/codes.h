@@ -15,14 +15,15 @@ namespace cdef {
 struct explanation {
     std::string_view code;
     std::string_view severity;
-    std::string_view name; /* that of a warning of cdef check; else empty */
+    std::string_view name; /* that of a warning; else empty */
     std::string_view title;
-    std::string_view cause;
-    std::string_view cure;
+    std::string cause;
+    std::string cure;
     const check::example *example; /* null: there is none */
 };
 
-/* Those of cdef check, then those of cdef verify; each in the order of the codes. */
+/* Those of cdef check, then those of cdef verify, then those of cdef diff and cdef gate; each in the order of the
+ * codes. */
 std::vector<explanation> explanations();
 
 /* The one with a code, in any case, or with a warning's name. Null if there is none. */

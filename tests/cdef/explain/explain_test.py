@@ -1,10 +1,11 @@
 """Test `cdef explain`. That the examples have their codes, a unit test shows."""
 
 import json
+import re
 import subprocess
 
 from compare import same
-from programs import PROGRAMS
+from programs import PROGRAMS, PROJECT
 
 
 def explain(*operands):
@@ -85,12 +86,33 @@ def test_number_that_contradicts_the_file():
     same(codes, sorted(codes, key=lambda code: (code.startswith("C"), code)), "order")
 
 
+CMP206 = """CMP206: error: a property is gone
+
+Cause:
+  Whoever relies on the older version is affected: clients may rely on the
+  property. It counts at the level `clients` and those after it.
+
+Cure:
+  Take the change back, or add something new beside what was there. If nobody
+  relies on the older version in this way, choose a level before this one.
+"""
+
+
+def test_codes_of_comparisons():
+    """Those of `cdef diff --compat`, and those of `cdef gate`."""
+    same(explain("CMP206"), (0, CMP206, ""), "CMP206")
+    same(explain("unrecorded-number"), explain("CMP404"), "CMP404")
+    table = (PROJECT / "docs/diff.md").read_text()
+    listed = {line.split()[0] for line in explain()[1].splitlines()}
+    assert set(re.findall(r"^\| `(CMP\d+)`", table, re.M)) <= listed
+
+
 def test_unknown_code():
     """Those that are one edit away are suggested, unless they are many. Numbers near each other mean nothing."""
     near = (("octl", "octal"), ("unbalance", "unbalanced"), ("S502x", "S502"), ("s5O9", "S509, S519 or S529"))
     for given, meant in near:
         same(explain(given), (2, "", f"cdef: {given}: no such code; did you mean {meant}?\n"), given)
-    for given in ("S10", "CDB801", "S5555", "S9999", "S700", "cdb999", "spam", ""):
+    for given in ("S10", "CDB801", "CMP999", "S5555", "S9999", "S700", "cdb999", "spam", ""):
         same(explain("S101", given), (2, "", f"cdef: {given}: no such code; 'cdef explain' lists all\n"), given)
 
 

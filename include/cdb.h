@@ -17,9 +17,12 @@ typedef vx_uint32_t cdb_uint32_t;                       /**< 32 bits, unsigned *
 typedef vx_int32_t cdb_int32_t;                         /**< 32 bits, two's complement */
 typedef vx_resource_class_id_t orb_resource_class_id_t; /**< a class number */
 
-/** A reference. In a file the first word is the offset, from the base that the field's comment names, and the second is
- * to be ignored; CDB_NONE in the first word means that there is nothing to refer to. The bytes are room for a pointer,
- * for a program that keeps the record in memory; bytes, so that the record's alignment does not depend on it. */
+/**
+ * A reference. In a file the first word is the offset, from the base that the field's comment names, and the second is
+ * to be ignored; CDB_NONE in the first word means that the reference leads to nothing. The bytes leave room for a
+ * pointer, for programs that keep the record in memory; they are bytes so that the record's alignment does not depend
+ * on the pointer.
+ */
 typedef union cdb_ref {
     cdb_uint32_t offset[2];   /**< in a file: the offset in bytes, then a word to ignore */
     unsigned char pointer[8]; /**< in memory: room for a pointer */
@@ -45,7 +48,7 @@ VX_ASSERT_SIZE(cdb_ref_t, 8);
 #define CDB_ID_SD_DEF CDB_ID('f')         /**< a definition of structured data */
 #define CDB_ID_VARIETY_LIST CDB_ID('g')   /**< a variety list */
 
-/** What a data section holds. Types 0 to 2 are not used, and 7 is never written. Stored as 32 bits. */
+/** The type of a data section. Types 0 to 2 are not used, and 7 is never written. Stored as 32 bits. */
 typedef enum cdb_dsect_type VX_ENUM_32 {
     CDB_DSECT_UNUSED = 0,
     CDB_DSECT_EMPTY = 1,
@@ -127,9 +130,11 @@ VX_ASSERT_OFFSET(cdb_dsect_anchor_t, cda_offset, 4);
 VX_ASSERT_OFFSET(cdb_dsect_anchor_t, cda_length, 8);
 VX_ASSERT_OFFSET(cdb_dsect_anchor_t, cda_revision, 12);
 
-/** A resource class, the root of a class section. Its tables follow it in the order of the references marked with
- * an asterisk; errors and dependencies come after the actions, then variety lists, definitions of structured byte
- * strings, SD definitions, valid values and strings. The offset of a table counts from the start of this record. */
+/**
+ * A resource class, the root of a class section. Its tables follow it in the order of the references marked with an
+ * asterisk; errors and dependencies follow the actions; then come variety lists, definitions of structured byte
+ * strings, SD definitions, valid values and strings. The offset of a table counts from the start of this record.
+ */
 typedef struct rsrc_class {
     cdb_uint32_t rc_cb_ID;               /**< CDB_ID_CLASS */
     cdb_uint32_t rc_props;               /**< property bits */
@@ -498,8 +503,10 @@ VX_ASSERT_OFFSET(rsrc_mgr_t, rm_spare, 6);
 VX_ASSERT_OFFSET(rsrc_mgr_t, u_rm_RMname, 8);
 VX_ASSERT_OFFSET(rsrc_mgr_t, u_rm_strings_table, 16);
 
-/** A class-to-manager map. Its string table follows. It has 60 bytes, so whatever follows a map
- * section is 4 bytes off a multiple of 8. */
+/**
+ * A class-to-manager map. Its string table follows. It has 60 bytes, so the section after it is 4 bytes off a multiple
+ * of 8.
+ */
 typedef struct rsrc_cmmap {
     cdb_uint32_t rcm_cb_ID;               /**< CDB_ID_CMMAP */
     orb_resource_class_id_t rcm_class_ID; /**< 0 */
@@ -590,14 +597,14 @@ VX_ASSERT_OFFSET(rsrc_class_hash_t, rc_hash_blocks, 8200);
 /** A context template; defined for readers, never written. */
 typedef struct ctx_tmplt {
     union {
-        cdb_int32_t u_offset[2];                                 /**< an offset */
-        cdb_ref_t u_ctxt_name;                                   /**< a name */
-        cdb_uint16_t u_ctxt_pattr_id;                            /**< a persistent attribute's number */
-    } u_ctxt; /**< an offset, a name or an attribute's number */ /**< an offset, a name or an attribute's number */
-    cdb_uint16_t ctxt_tbl_index;                                 /**< index in its table */
-    cdb_uint16_t ctxt_type;                                      /**< kind of the template */
-    cdb_uint16_t ctxt_class_id;                                  /**< class number */
-    cdb_uint16_t ctxt_dattr_id;                                  /**< a dynamic attribute's number */
+        cdb_int32_t u_offset[2];      /**< an offset */
+        cdb_ref_t u_ctxt_name;        /**< a name */
+        cdb_uint16_t u_ctxt_pattr_id; /**< a persistent attribute's number */
+    } u_ctxt;                         /**< an offset, a name or an attribute's number */
+    cdb_uint16_t ctxt_tbl_index;      /**< index in its table */
+    cdb_uint16_t ctxt_type;           /**< kind of the template */
+    cdb_uint16_t ctxt_class_id;       /**< class number */
+    cdb_uint16_t ctxt_dattr_id;       /**< a dynamic attribute's number */
 } ctx_tmplt_t;
 VX_ASSERT_SIZE(ctx_tmplt_t, 16);
 VX_ASSERT_OFFSET(ctx_tmplt_t, ctxt_tbl_index, 8);

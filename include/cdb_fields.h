@@ -1,7 +1,7 @@
 /**
  * @file
- * The fields of every record of a class definition database as data, one table for each record: where a field is, what
- * it holds, and what becomes of it when a file is reversed to the other byte order. Reversal, inspection and
+ * The fields of every record of a class definition database as data, one table for each record: where a field is,
+ * what it holds, and how it changes when a file is reversed to the other byte order. Reversal, inspection and
  * verification loop over these tables. C++20.
  *
  * Each table covers its record without gap or overlap, which is checked while compiling.
@@ -24,7 +24,7 @@
 
 namespace cdb {
 
-/** What a field holds, and so what becomes of it in the other byte order. */
+/** What a field holds, which decides how it is reversed. */
 enum class field_kind : std::uint8_t {
     number,    /**< a number, or count of them: reversed whole */
     reference, /**< a cdb_ref_t: its first word is reversed */
@@ -33,10 +33,13 @@ enum class field_kind : std::uint8_t {
     entries    /**< the first entry of a list; entries have a table of their own */
 };
 
-/** The table of the class that an offset counts from; for managers, maps and variable classes, of the section. */
+/**
+ * The table that a reference's offset counts from: a table of the class, or for managers, maps and variable classes, of
+ * the section.
+ */
 enum class target : std::uint8_t { none, strings, variety_lists, valid_vals, sd_defs, section };
 
-/** For type_at of a value: the data type is not in the record, but in the record that refers to it. */
+/** Used as the type_at of a value whose data type is in the record that refers to this one. */
 inline constexpr std::uint16_t TYPE_OF_OWNER = 0xFFFF;
 
 /** One field of a record. */
@@ -58,13 +61,13 @@ consteval field stays(field row) {
     return row;
 }
 
-/** The row, marked as a reference that may be none. */
+/** The row, marked as a reference that may lead to nothing. */
 consteval field or_none(field row) {
     row.optional = true;
     return row;
 }
 
-/** True if the fields cover a record of so many bytes, in order, without gap or overlap. */
+/** True if the fields cover a record of this size in bytes, in order, without gap or overlap. */
 consteval bool tiles(std::span<const field> fields, std::size_t size) {
     std::size_t at = 0;
     for (const field &f : fields) {
@@ -87,9 +90,9 @@ consteval bool tiles(std::span<const field> fields, std::size_t size) {
     }
 /** The row of a member that is not a reference or a value. */
 #define CDB_FIELD(record, member, kind) CDB_ROW(record, member, ::cdb::field_kind::kind)
-/** The row of a reference, and the table that it leads into. */
+/** The row of a reference; its target is the table that it leads into. */
 #define CDB_REF(record, member, to) CDB_ROW(record, member, ::cdb::field_kind::reference, ::cdb::target::to)
-/** The row of a value, and the offset of the field that holds its type. */
+/** The row of a value; its type is in the named field. */
 #define CDB_VALUE(record, member, type_at)                                                                             \
     CDB_ROW(record, member, ::cdb::field_kind::value, ::cdb::target::strings, type_at)
 
@@ -399,7 +402,9 @@ inline constexpr field class_hash_fields[] = {
 };
 static_assert(tiles(class_hash_fields, sizeof(rsrc_class_hash_t)));
 
-/** The fields of ctx_tmplt_t. One member of the union is an offset, so the union is treated as one. No file holds one.
+/**
+ * The fields of ctx_tmplt_t. One member of the union is an offset, so the whole union is treated as an offset. No file
+ * contains this record.
  */
 inline constexpr field ctx_tmplt_fields[] = {
     CDB_ROW(ctx_tmplt_t, u_ctxt, ::cdb::field_kind::reference),

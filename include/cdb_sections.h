@@ -19,7 +19,7 @@ namespace cdb {
 
 /* ---- Inside a class -------------------------------------------------------------------------------------------- */
 
-/** A class section, and those of its tables that others refer to. */
+/** A class section, and those of its tables that records refer to. */
 struct class_tables {
     /** The whole section, from the class record on. */
     bytes section;
@@ -35,7 +35,7 @@ struct class_tables {
 
 /** A range of varieties, both ends included. */
 struct variety {
-    /** Bytes that one takes in the file. */
+    /** Size in the file, in bytes. */
     static constexpr std::size_t SIZE = sizeof(vl_entry_t);
 
     /** The entry at a byte offset of the table. */
@@ -52,7 +52,7 @@ struct variety {
 /** The varieties of an attribute or an action. */
 using variety_list = list_of<variety, bytes>;
 
-/** What a list of valid values needs to be read. */
+/** What is needed to read a list of valid values. */
 struct valid_value_context {
     /** The tables of the class. */
     class_tables tables;
@@ -65,7 +65,7 @@ struct valid_value_context {
  * elements are followed here.
  */
 struct valid_value {
-    /** Bytes that one takes in the file. */
+    /** Size in the file, in bytes. */
     static constexpr std::size_t SIZE = sizeof(vv_entry_t);
 
     /** The entry at a byte offset of the table. */
@@ -85,7 +85,7 @@ struct valid_value {
 /** The valid values of an attribute or an element. */
 using valid_value_list = list_of<valid_value, valid_value_context>;
 
-/** The list that a reference leads to; empty if the reference is none. */
+/** The list that a reference leads to; empty if the reference leads to nothing. */
 inline variety_list varieties_at(const class_tables &tables, const cdb_ref_t &ref) {
     std::uint64_t at = ref.offset[0];
     if (ref.offset[0] == CDB_NONE)
@@ -96,8 +96,8 @@ inline variety_list varieties_at(const class_tables &tables, const cdb_ref_t &re
 }
 
 /**
- * The list that a reference leads to; empty if the reference is none. `owner` is the data type of the attribute or
- * element that the values are valid for.
+ * The list that a reference leads to; empty if the reference leads to nothing. `owner` is the data type of the
+ * attribute or element that the values are valid for.
  */
 inline valid_value_list valid_values_at(const class_tables &tables, const cdb_ref_t &ref, vx_data_type_t owner) {
     std::uint64_t at = ref.offset[0];
@@ -111,7 +111,7 @@ inline valid_value_list valid_values_at(const class_tables &tables, const cdb_re
 /** An element of a definition of structured data. */
 class sd_element {
 public:
-    /** Bytes that one takes in the file. */
+    /** Size in the file, in bytes. */
     static constexpr std::size_t SIZE = sizeof(sd_field_t);
 
     /** The element at a byte offset of the table. */
@@ -142,7 +142,7 @@ private:
 /** A definition of structured data: its elements, in their order. */
 using sd_definition = list_of<sd_element, class_tables>;
 
-/** The definition that a reference leads to; empty if the reference is none. */
+/** The definition that a reference leads to; empty if the reference leads to nothing. */
 inline sd_definition sd_definition_at(const class_tables &tables, const cdb_ref_t &ref) {
     std::uint64_t at = ref.offset[0];
     if (ref.offset[0] == CDB_NONE)
@@ -158,7 +158,7 @@ inline sd_definition sd_definition_at(const class_tables &tables, const cdb_ref_
  */
 template <class Record> class attribute {
 public:
-    /** Bytes that one takes in the file. */
+    /** Size in the file, in bytes. */
     static constexpr std::size_t SIZE = sizeof(Record);
 
     /** The attribute at a byte offset of the class section. */
@@ -211,7 +211,7 @@ public:
     }
     /**
      * The lower bound of a dynamic attribute: a number, or an array of one. If verify() warns with CDB452, it belongs
-     * to another attribute: ignore it. Nothing deeper than the array is followed.
+     * to another attribute: ignore it. Elements of the array are not followed further.
      */
     value min_value() const requires std::is_same_v<Record, rsrc_dattr_t> {
         return cell(offsetof(rsrc_dattr_t, ra_min_value), NESTING_MAX - 1);
@@ -247,7 +247,7 @@ using dynamic_attribute = attribute<rsrc_dattr_t>;
 /** An action of a class or of its resources. */
 class action {
 public:
-    /** Bytes that one takes in the file. */
+    /** Size in the file, in bytes. */
     static constexpr std::size_t SIZE = sizeof(rsrc_action_t);
 
     /** The action at a byte offset of the class section. */
@@ -272,11 +272,11 @@ public:
     variety_list varieties() const {
         return varieties_at(tables, fields.u_ac_variety_list);
     }
-    /** The elements of what the action takes; empty if it takes nothing. */
+    /** The elements of the action's input; empty if it has none. */
     sd_definition input() const {
         return sd_definition_at(tables, fields.u_ac_sd_input);
     }
-    /** The elements of what the action answers; empty if it answers nothing. */
+    /** The elements of the action's response; empty if it has none. */
     sd_definition response() const {
         return sd_definition_at(tables, fields.u_ac_sd_resp);
     }
@@ -288,7 +288,7 @@ private:
 
 /* ---- Sections -------------------------------------------------------------------------------------------------- */
 
-/** Whose attributes or actions are meant: those of each resource of a class, or those of the class itself. */
+/** The owner of attributes or actions: each resource of a class, or the class itself. */
 enum class level { of_resource, of_class };
 
 /** A class section. */
@@ -416,7 +416,7 @@ private:
 
 /** A dynamic attribute of a variable class. */
 struct variable_id {
-    /** Bytes that one takes in the file. */
+    /** Size in the file, in bytes. */
     static constexpr std::size_t SIZE = sizeof(var_id_t);
 
     /** The entry at a byte offset of the section. */

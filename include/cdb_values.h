@@ -26,7 +26,7 @@ namespace cdb {
 
 /* ---- Data types ------------------------------------------------------------------------------------------------ */
 
-/** Values inside values are followed to this depth, and no further. The compiler writes at most 4. */
+/** The greatest depth to which values inside values are followed. The compiler writes at most 4. */
 inline constexpr unsigned NESTING_MAX = 64;
 
 /** True if the number is one of the 23 data types, 0 to 22. A file may hold any number. */
@@ -46,7 +46,7 @@ constexpr vx_data_type_t element_type(vx_data_type_t type) {
 
 /**
  * True if values of the type are stored in the strings of the class, so that the cell holds their offset. False for
- * structured byte strings, which are stored there too but cannot be read.
+ * structured byte strings, which would be stored there too but cannot be read.
  */
 constexpr bool is_out_of_line(vx_data_type_t type) {
     return (type >= VX_CHAR_PTR && type <= VX_SD_PTR) || is_array(type);
@@ -61,14 +61,14 @@ std::string_view name_of(vx_data_type_t type);
 /* ---- Bytes ----------------------------------------------------------------------------------------------------- */
 
 /**
- * A stretch of a database, and the byte order of its file. It refers to bytes that somebody else keeps. Whatever lies
- * outside of it reads as zero.
+ * A part of a database, and the byte order of its file. It refers to bytes that the caller keeps. Reading outside of it
+ * gives zeros.
  */
 class bytes {
 public:
     /** No bytes, in the byte order of this machine. */
     bytes() = default;
-    /** Refers to `stretch`, which must live as long as this object and everything made from it. */
+    /** Refers to `stretch`, which must remain valid as long as this object and everything made from it. */
     bytes(std::span<const std::byte> stretch, std::endian order) : all(stretch), file_order(order) {}
 
     /** The number of bytes. */
@@ -84,16 +84,16 @@ public:
         return all;
     }
     /**
-     * True if `length` bytes from `offset` on lie inside. Both are in bytes; neither can overflow. Offsets and lengths
-     * have 64 bits on every machine, because sums of two numbers of a file do not fit into 32.
+     * True if the `length` bytes from `offset` on are inside. No arguments cause an overflow. Offsets and lengths have
+     * 64 bits on every machine, because the sum of two numbers from a file may not fit into 32.
      */
     bool holds(std::uint64_t offset, std::uint64_t length) const {
         return offset <= all.size() && length <= all.size() - offset;
     }
 
     /**
-     * A number or an enumeration of the file at `offset`, in the byte order of this machine. Returns 0 if it is not
-     * wholly inside. The offset needs no alignment.
+     * A number or an enumeration of the file at `offset`, in the byte order of this machine. Returns 0 if some of its
+     * bytes are outside. The offset needs no alignment.
      */
     template <class Number> Number number(std::uint64_t offset) const {
         std::array<std::byte, sizeof(Number)> raw_number = {};
@@ -106,8 +106,8 @@ public:
 
     /**
      * A copy of the record at `offset`, with its numbers and references in the byte order of this machine. Value cells
-     * are left as they are in the file; class value reads them. Returns a record of zeros if it is not wholly inside.
-     * The offset needs no alignment.
+     * are left as they are in the file; class value reads them. Returns a record of zeros if some of its bytes are
+     * outside. The offset needs no alignment.
      */
     template <class Record> Record record(std::uint64_t offset) const {
         Record copy = {};
@@ -131,8 +131,8 @@ public:
     }
 
     /**
-     * The text from `offset` to its zero byte, which is not included. If there is none, the text ends with the stretch.
-     * Empty if the offset lies outside. It refers to the database's bytes.
+     * The text from `offset` to its zero byte, which is not included. If there is no zero byte, the text ends with
+     * these bytes. Empty if the offset lies outside. It refers to the database's bytes.
      */
     std::string_view text(std::uint64_t offset) const {
         if (offset >= all.size())
@@ -143,7 +143,7 @@ public:
         return {start, zero == nullptr ? room : static_cast<std::size_t>(static_cast<const char *>(zero) - start)};
     }
 
-    /** The text that a reference leads to, as for an offset. Empty if the reference is none. */
+    /** The text that a reference leads to, as for an offset. Empty if the reference leads to nothing. */
     std::string_view text(const cdb_ref_t &ref) const {
         return ref.offset[0] == CDB_NONE ? std::string_view() : text(std::uint64_t{ref.offset[0]});
     }
@@ -175,18 +175,18 @@ private:
  */
 template <class List, class Item> class list_iterator {
 public:
-    /** What it makes. */
+    /** The type of the items. */
     using value_type = Item;
-    /** As the standard asks. */
+    /** Required by the standard. */
     using difference_type = std::ptrdiff_t;
-    /** Items are made, so references to them do not last. */
+    /** Only an input iterator for C++17 algorithms, because items are temporary. */
     using iterator_category = std::input_iterator_tag;
-    /** It may be copied, and the list walked several times. */
+    /** A forward iterator for C++20: the list may be walked several times. */
     using iterator_concept = std::forward_iterator_tag;
 
-    /** An iterator of no list; it may only be assigned to. */
+    /** An iterator without a list; it may only be assigned to. */
     list_iterator() = default;
-    /** At an index of a list, of which it keeps a copy. */
+    /** An iterator at an index of a list, of which it keeps a copy. */
     list_iterator(const List &walked, std::size_t start) : list(walked), index(start) {}
     /** Makes the item. The iterator must not be at the end. */
     Item operator*() const {
@@ -221,7 +221,7 @@ template <class Item, class Context> class list_of {
 public:
     /** An empty list. */
     list_of() = default;
-    /** `count` items from the byte `offset` on. What the offset counts from is for the context to say. */
+    /** `count` items from the byte `offset` on. The context defines what the offset counts from. */
     list_of(const Context &of, std::uint64_t offset, std::size_t count) : context(of), first(offset), items(count) {}
 
     /** The number of items. */
@@ -255,7 +255,7 @@ private:
 };
 
 /**
- * How many of `count` items, of `size` bytes each, lie wholly inside `area` if the first begins at `offset`. `size`
+ * How many of `count` items of `size` bytes each are completely inside `area` if the first begins at `offset`. `size`
  * must not be 0.
  */
 inline std::size_t count_inside(const bytes &area, std::uint64_t offset, std::uint64_t count, std::size_t size) {
@@ -287,11 +287,11 @@ template <class List> auto find(const List &list, std::int32_t id) {
 
 class value;
 
-/** What the elements of an array or of structured data need to be read. */
+/** What is needed to read the elements of an array or of structured data. */
 struct value_context {
     /** The strings of the class. */
     bytes strings;
-    /** The type of an array's elements; VX_UNKNOWN for structured data, whose elements name their types themselves. */
+    /** The type of an array's elements; VX_UNKNOWN for structured data, in which each element has its own type. */
     vx_data_type_t array_element = VX_UNKNOWN;
     /** How many arrays and structures the elements are inside of. */
     unsigned nesting = 0;
@@ -338,7 +338,9 @@ class value {
 public:
     /** A value that is not present. */
     value() = default;
-    /** The value whose cell is at a byte offset of an area. If the cell is not wholly inside, it reads as zeros. */
+    /**
+     * The value whose cell is at a byte offset of an area. If some of the cell's bytes are outside, it reads as zeros.
+     */
     value(const bytes &area, std::uint64_t offset, vx_data_type_t data_type, const bytes &class_strings,
           unsigned depth = 0)
         : cell_type(data_type), strings(class_strings), nesting(depth) {
@@ -352,9 +354,9 @@ public:
     }
 
     /**
-     * Where an out-of-line value is: its offset in bytes from the start of the class's strings. Nothing for other
-     * types, for none, for a cell that was never filled (0 is where the class's first name is), and for an offset
-     * outside of the strings.
+     * Where an out-of-line value is: its offset in bytes from the start of the class's strings. No value for other
+     * types, for a cell that refers to nothing, for a cell that was never filled (which is 0, the offset of the class's
+     * first name), and for an offset outside of the strings.
      */
     std::optional<std::uint32_t> place() const {
         auto offset = number<std::uint32_t>();
@@ -363,7 +365,7 @@ public:
         return offset;
     }
 
-    /** True if there is something to read: a number, or an out-of-line value in its place. */
+    /** True if there is something to read: a number, or an out-of-line value that the cell leads to. */
     bool present() const {
         return (cell_type >= VX_INT32 && cell_type <= VX_FLOAT64) || place().has_value();
     }
@@ -390,8 +392,8 @@ public:
         return cell_type == VX_CHAR_PTR && place() ? strings.text(std::uint64_t{*place()}) : std::string_view();
     }
     /**
-     * The bytes of a `Binary`; empty for any other type, if it is not present, and if they do not all lie inside the
-     * strings. They are a piece of their own, 8 bytes after the length.
+     * The bytes of a `Binary`; empty for any other type, if it is not present, and if they are not all inside the
+     * strings. They are stored separately from the length, 8 bytes after it.
      */
     std::span<const std::byte> binary() const {
         if (cell_type != VX_BINARY_PTR || !place())

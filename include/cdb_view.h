@@ -3,10 +3,10 @@
  * The reader: reads a class definition database without trusting it. C++20, namespace cdb; link with the library
  * cdb_view.
  *
- * A view refers to bytes that somebody else keeps, such as those of read_file() or of a mapping. It copies only single
+ * A view refers to bytes that the caller keeps, such as those of read_file() or of a mapping. It copies only single
  * records, allocates nothing, and reads either byte order from any alignment. Whatever the bytes are, no view reads
  * outside of them: a reference that leads nowhere reads as zeros, an empty text or an empty list. verify() says, once,
- * whether a database is sound; after that, what the views show can be relied on.
+ * whether a database is sound; after that, everything that the views show is reliable.
  *
  * docs/reader.md has a whole program, docs/format.md describes the file byte by byte.
  */
@@ -39,22 +39,22 @@ namespace cdb {
 template <class View> class sections_of;
 
 /**
- * A class definition database in memory. It refers to bytes that somebody else keeps: they must stay, unchanged, as
- * long as the database or anything that came from it is used. Views, lists, values and texts refer to the bytes
- * themselves, not to this object, which may go away earlier. All members may be called from several threads at once.
+ * A class definition database in memory. It refers to bytes that the caller keeps. They must stay unchanged as long as
+ * the database or anything that came from it is used. Views, lists, values and texts refer to the bytes themselves, not
+ * to this object, which may be destroyed earlier. All members may be called from several threads at once.
  */
 class database {
 public:
     /** A database without bytes. It has no sections and is not recognised(). */
     database() = default;
     /**
-     * The database in these bytes, a whole file, of any alignment. It takes constant time and checks nothing; verify()
-     * does.
+     * The database in these bytes, which are a whole file and need no alignment. Takes constant time and checks
+     * nothing; verify() does.
      */
     explicit database(std::span<const std::byte> file);
     /**
-     * Does not compile, because the bytes of `database(read_file(...))` would be gone at once. Keep what read_file()
-     * returns.
+     * Does not compile, because the bytes of `database(read_file(...))` would be freed at once. Keep the result of
+     * read_file() in a variable.
      */
     explicit database(const std::vector<std::byte> &&) = delete;
 
@@ -80,7 +80,7 @@ public:
     const orb_cdb_header_t &header() const {
         return head;
     }
-    /** The number of sections: as many as the header says, or as there are anchors in the file if these are fewer. */
+    /** The number of sections: the number in the header, or the number of anchors in the file if that is smaller. */
     std::size_t section_count() const {
         return count_inside(all, sizeof head, head.cdb_hdr_dsect_count, sizeof(cdb_dsect_anchor_t));
     }
@@ -89,8 +89,8 @@ public:
         return all.record<cdb_dsect_anchor_t>(sizeof head + std::uint64_t{index} * sizeof(cdb_dsect_anchor_t));
     }
     /**
-     * The bytes of a section. Shorter than its anchor says, or empty, if they are not all inside the file. `index` must
-     * be less than section_count().
+     * The bytes of a section. They are fewer than its anchor says, or none, if some are outside of the file. `index`
+     * must be less than section_count().
      */
     bytes section(std::size_t index) const {
         cdb_dsect_anchor_t where = anchor(index);
@@ -103,7 +103,7 @@ public:
     sections_of<manager> managers() const;
     /** The class-to-manager map sections. The compiler writes one. */
     sections_of<class_map> maps() const;
-    /** The variable class sections, perhaps none. */
+    /** The variable class sections. There may be none. */
     sections_of<variable_class> variable_classes() const;
 
 private:
@@ -115,21 +115,21 @@ private:
 /** The sections of one type, in the order of the file. It has no size(): walk it. */
 template <class View> class sections_of {
 public:
-    /** Walks the sections, and makes a view of each when it is asked for. */
+    /** Walks the sections, and makes the view of each only when it is dereferenced. */
     class iterator {
     public:
-        /** What it makes. */
+        /** The type of the views. */
         using value_type = View;
-        /** As the standard asks. */
+        /** Required by the standard. */
         using difference_type = std::ptrdiff_t;
-        /** Views are made, so references to them do not last. */
+        /** Only an input iterator for C++17 algorithms, because views are temporary. */
         using iterator_category = std::input_iterator_tag;
-        /** It may be copied, and the sections walked several times. */
+        /** A forward iterator for C++20: the sections may be walked several times. */
         using iterator_concept = std::forward_iterator_tag;
 
-        /** An iterator of no database; it may only be assigned to. */
+        /** An iterator without a database; it may only be assigned to. */
         iterator() = default;
-        /** At the first section of the type from an index of the anchors on. */
+        /** An iterator at the first section of the type whose anchor's index is at least `start`. */
         iterator(const database &walked, std::size_t start) : db(walked), index(start) {
             skip();
         }
@@ -164,7 +164,7 @@ public:
         std::size_t index = 0;
     };
 
-    /** The sections of a database, of which it keeps a copy; the bytes are not copied. */
+    /** The sections of a database. The object keeps a copy of `of`, but not of the bytes. */
     explicit sections_of(const database &of) : db(of) {}
 
     /** The first section of the type. */
@@ -194,8 +194,8 @@ inline sections_of<variable_class> database::variable_classes() const {
 }
 
 /**
- * Reads a whole file. `path` is a file name, or anything that can be opened and read to its end. On failure `error` is
- * set and nothing is returned; otherwise `error` is cleared. May throw std::bad_alloc.
+ * Reads a whole file. `path` may name anything that can be opened and read to its end. On failure `error` is set and no
+ * bytes are returned; otherwise `error` is cleared. May throw std::bad_alloc.
  */
 std::vector<std::byte> read_file(const char *path, std::error_code &error);
 
@@ -203,21 +203,21 @@ std::vector<std::byte> read_file(const char *path, std::error_code &error);
 
 /**
  * How bad a finding is. An error would make reading unsafe, endless or ambiguous. A warning is about something that the
- * compiler itself can make of a careless source.
+ * compiler itself can make from a careless source.
  */
 enum class severity : std::uint8_t { warning, error };
 
 /** Something that verify() checks. docs/reader.md lists the rules. */
 struct rule {
-    /** Permanent, such as `CDB104`. */
+    /** The code, such as `CDB104`, which never changes. */
     std::string_view code;
-    /** Of all findings of the rule. */
+    /** The severity of all findings of the rule. */
     severity level;
     /** What is wrong, such as `wrong checksum`. */
     std::string_view title;
-    /** How it comes about: sentences. */
+    /** How it comes about, in whole sentences. */
     std::string_view cause = {};
-    /** What to do about it: sentences. */
+    /** What to do about it, in whole sentences. */
     std::string_view cure = {};
 };
 
@@ -235,32 +235,32 @@ inline constexpr std::string_view CODE_RANGE_ASTRAY = "CDB452";
 struct finding {
     /** The rule; never null, never freed. */
     const rule *broken;
-    /** The section's position among the anchors; nothing if the finding is about the file as a whole. */
+    /** The section's position among the anchors; no value if the finding is about the file as a whole. */
     std::optional<std::size_t> section;
     /** The record's type, as in cdb.h; may be empty. */
     std::string_view record;
     /**
-     * Position of the record in its table, or of the entry in its list. Of a list itself, its offset in bytes in its
-     * table.
+     * Position of the record in its table, or of the entry in its list. For a list itself, its offset in its table, in
+     * bytes.
      */
     std::size_t index;
     /** The record's field, as in cdb.h; may be empty. */
     std::string_view field;
-    /** Where in the file, in bytes. */
+    /** The offset in the file, in bytes. */
     std::size_t offset;
-    /** What is there, for people to read. */
+    /** What the file contains there, as text for people. */
     std::string found;
-    /** What should be there, for people to read. */
+    /** What the file should contain there, as text for people. */
     std::string expected;
 };
 
-/** What a stretch of the file is. It does not refer to the bytes of the database. */
+/** The meaning of some consecutive bytes of the file. It does not refer to the bytes of the database. */
 struct region {
     /** Where it begins in the file, in bytes. */
     std::size_t offset;
     /** How long it is, in bytes. */
     std::size_t size;
-    /** The section's position among the anchors; nothing outside of all sections. */
+    /** The section's position among the anchors; no value outside of all sections. */
     std::optional<std::size_t> section;
     /**
      * The record's type as in cdb.h, or `text`, `length`, `binary`, `handle`, `vx_value_t`, `var_id_t`, `filling` or
@@ -269,26 +269,26 @@ struct region {
     std::string_view record;
     /** Position of the record in its table, or of the entry in its list. */
     std::size_t index;
-    /** The record's field; null for what is not part of a record. Never freed. */
+    /** The record's field; null if the region is not part of a record. Never freed. */
     const struct field *what;
 };
 
 /**
- * Checks the whole file once. Returns what it finds, in the order length, format, checksum, record sizes, reserved
- * bytes, anchors, sections; an empty list for a flawless file. Takes time in proportion to the file, and memory of half
- * of its size besides the findings. May throw std::bad_alloc.
+ * Checks the whole file once. Returns the findings, in the order length, format, checksum, record sizes, reserved
+ * bytes, anchors, sections; an empty list if nothing is wrong. Takes time proportional to the file's size, and memory
+ * of half of that size besides the findings. May throw std::bad_alloc.
  */
 std::vector<finding> verify(const database &db);
 
 /**
- * The same, but hands over each finding as soon as it is made, so that they need not be in memory together: a damaged
- * file may have many.
+ * The same, but passes each finding to `take` as soon as it is found. The findings of a damaged file may be too many to
+ * keep in memory.
  */
 void verify(const database &db, const std::function<void(finding &&)> &take);
 
 /**
- * True if there are no errors among the findings. There may be warnings. What the views show of a sound file can be
- * relied on.
+ * True if there are no errors among the findings. There may be warnings. What the views show of a sound file is
+ * reliable.
  */
 bool is_sound(std::span<const finding> findings);
 
@@ -296,13 +296,13 @@ bool is_sound(std::span<const finding> findings);
 std::span<const rule> rules();
 
 /**
- * Says of every byte of the file what it is: the regions cover the file without gap or overlap, in its order. What no
- * reference reaches is `unreached`. Nothing is required of the file. Takes somewhat longer than verify(). May throw
+ * Returns the meaning of every byte of the file. The regions cover the file without gap or overlap, in its order. Bytes
+ * that no reference reaches are `unreached`. The file may be anything. Takes somewhat longer than verify(). May throw
  * std::bad_alloc.
  */
 std::vector<region> regions(const database &db);
 
-/** The same, but hands over each region as soon as those before it are known. */
+/** The same, but passes each region to `take` as soon as those before it are known. */
 void regions(const database &db, const std::function<void(const region &)> &take);
 
 } // namespace cdb

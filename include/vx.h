@@ -22,7 +22,7 @@
 /** A compile-time check of where a field is, in bytes from the start of its record. */
 #define VX_ASSERT_OFFSET(type, field, where) VX_ASSERT(offsetof(type, field) == (where))
 
-/** Enumerations that a file holds have 32 bits, and in a file may have any value. */
+/** Makes enumerations 32 bits wide. In a file, a field of such a type may have any value. */
 #ifdef __cplusplus
 #define VX_ENUM_32 : uint32_t
 #else
@@ -108,7 +108,7 @@ typedef struct vx_resource_handle {
 VX_ASSERT_SIZE(vx_resource_handle_t, 20);
 VX_ASSERT_OFFSET(vx_resource_handle_t, id, 4);
 
-/** What one field of a structured byte string holds; appears in sbs_field.sb_field_type. */
+/** The type of one field of a structured byte string; see sbs_field.sb_field_type. */
 typedef enum vx_sbs_field_data_type {
     VX_SF_INT32 = 0,
     VX_SF_FLOAT32 = 1,
@@ -143,10 +143,12 @@ typedef vx_structured_data_t *vx_sd_ptr_t;              /**< SD, in memory */
 typedef vx_sbs_t *vx_sbs_ptr_t;                         /**< SBS, in memory */
 typedef vx_array_t *vx_array_ptr_t;                     /**< an array, in memory */
 
-/** The value cell. In a database an out-of-line value is its byte offset from the start of the owning class's string
- * table, in val_uint32, all ones mean that there is none. Ignore the other four bytes then. Numbers of 32 bits
- * are in the first four bytes, numbers of 64 bits in all eight. The pointers are for programs that keep values in
- * memory. */
+/**
+ * The value cell. In a database an out-of-line value is stored as its byte offset from the start of the owning class's
+ * string table, in val_uint32; all ones mean that there is no value. Ignore the other four bytes of such a cell.
+ * Numbers of 32 bits are in the first four bytes, numbers of 64 bits in all eight. The pointers are for programs that
+ * keep values in memory.
+ */
 typedef union vx_value {
     vx_int32_t val_int32;                     /**< Int32 */
     vx_uint32_t val_uint32;                   /**< UInt32; for an out-of-line value its offset */

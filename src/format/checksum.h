@@ -18,7 +18,7 @@ template <class Word> Word cdb_checksum_word(const char *from) {
 inline vx_uint32_t cdb_checksum(const char *image, vx_uint32_t start, vx_uint32_t length) {
     const char *word = image + offsetof(orb_cdb_header_t, cdb_hdr_format);
     size_t words = (length - 4) / 4;
-    std::array<vx_uint64_t, 4> sums = {}; /* two words at a time in each: XOR does not mind the order */
+    std::array<vx_uint64_t, 4> sums = {}; /* two words at a time in each; the order does not matter for XOR */
     for (; words >= 8; words -= 8)
         for (vx_uint64_t &sum : sums) {
             sum ^= cdb_checksum_word<vx_uint64_t>(word);

@@ -1,5 +1,5 @@
-/* facts.h: what the fields of records mean: one row for each field of each record that a file may hold, in the order of
- * include/cdb_fields.h. A field without a row, or a row without a field, does not compile. */
+/* facts.h: the meaning of the fields of records. There is one row for each field of each record that a file may
+ * contain, in the order of include/cdb_fields.h. A field without a row, or a row without a field, does not compile. */
 #ifndef CDGEN_FORMAT_FACTS_H
 #define CDGEN_FORMAT_FACTS_H
 
@@ -12,7 +12,8 @@
 
 namespace cdb {
 
-/* What a number or reference stands for, if not for itself or for what its row in cdb_fields.h says. */
+/* The meaning of a number or reference, if it is not a plain number or the reference that its row in cdb_fields.h
+ * describes. */
 enum class meaning : std::uint8_t {
     PLAIN,
     SIGNED,
@@ -39,19 +40,19 @@ enum class meaning : std::uint8_t {
     UNUSED  /* a reference that is 0 in every compiled file */
 };
 
-/* What a field is to somebody who compares records. */
+/* The role of a field in a comparison of records. */
 enum class role : std::uint8_t {
     CONTENT,
     NAME,   /* finds the record */
     NUMBER, /* likewise, for programs */
-    LAYOUT  /* where things are stored, how many or how long they are, or when the file was made: no content */
+    LAYOUT  /* layout, not content: where things are stored, how many or how long they are, or when the file was made */
 };
 
 struct field_fact {
     std::string_view field; /* as in cdb_fields.h */
     meaning as = meaning::PLAIN;
     role is = role::CONTENT;
-    std::string_view words = {};              /* what a person calls it; without words, its own name */
+    std::string_view words = {};              /* its name in messages; if empty, the name of the field */
     std::string_view lines = {};              /* attributes, or runs of SD stanzas, that fill it: "A B" */
     std::optional<std::uint32_t> always = {}; /* the value that the compiler gives it in every file */
 
@@ -60,7 +61,7 @@ struct field_fact {
     }
 };
 
-/* The names of the bits in a field of properties; none for any other field. */
+/* The names of the bits in a field of properties; empty for any other field. */
 constexpr std::span<const props_t> properties_of(meaning as) {
     switch (as) {
     case meaning::CLASS_PROPERTIES:
@@ -76,7 +77,7 @@ constexpr std::span<const props_t> properties_of(meaning as) {
     }
 }
 
-/* The number that stands for nothing in a field of this meaning. */
+/* The number that means "none" in a field of this meaning. */
 constexpr std::optional<std::uint32_t> none_of(meaning as) {
     switch (as) {
     case meaning::NONE_IS_0:
@@ -104,7 +105,7 @@ consteval field_fact filled(std::string_view field, std::string_view lines, std:
     return {.field = field, .as = as, .words = words, .lines = lines};
 }
 
-/* Likewise; its records are found by it. */
+/* The same, for a field by which records are found. */
 consteval field_fact name(std::string_view field, std::string_view lines = {}) {
     return {.field = field, .is = role::NAME, .lines = lines};
 }
@@ -122,17 +123,17 @@ consteval field_fact constant(std::string_view field, std::string_view words = {
     return {.field = field, .as = as, .words = words, .always = value};
 }
 
-/* Lines say something that another record holds; the compiler leaves 0 here. */
+/* Lines of a source set a field of another record; the compiler leaves 0 here. */
 consteval field_fact elsewhere(std::string_view field, std::string_view lines, std::string_view words, meaning as) {
     return {.field = field, .as = as, .words = words, .lines = lines, .always = 0};
 }
 
-/* Of a record that the compiler does not make. */
+/* A field of a record that the compiler does not write. */
 consteval field_fact unmade(std::string_view field, std::string_view words = {}, meaning as = PLAIN) {
     return {.field = field, .as = as, .words = words};
 }
 
-/* Reserved bytes, or the place where entries begin. */
+/* Reserved bytes, or the beginning of a list's entries. */
 consteval field_fact nothing(std::string_view field) {
     return {.field = field, .is = role::LAYOUT};
 }

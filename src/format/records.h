@@ -1,4 +1,4 @@
-/* records.h: the records that a file may hold: their fields, what these mean, and their sizes. */
+/* records.h: the records that a file may contain, with their fields, the meanings of the fields, and their sizes. */
 #ifndef CDGEN_FORMAT_RECORDS_H
 #define CDGEN_FORMAT_RECORDS_H
 
@@ -13,8 +13,9 @@ struct record_format {
     std::span<const field> fields;
     std::span<const field_fact> facts; /* one for each field, in the same order */
     std::size_t size;                  /* bytes; of a list and a class hash, without the entries */
-    const field *name = nullptr;       /* leads to the record's name; null: it has none */
-    const field *type = nullptr;       /* the data type of its values; null: it names none */
+    const field *name = nullptr;       /* the field that leads to the record's name; null: the record has no name */
+    const field *type = nullptr;       /* the field with the data type of its values; null: the record has no such field
+                                        * */
 
     /* Of the field that starts at this offset; one must. */
     constexpr const field_fact &fact_at(std::size_t offset) const {
@@ -28,8 +29,8 @@ struct record_format {
     }
 };
 
-/* Every field has its row, and a place that a reference says has to be OFFSET or UNUSED, so that nobody reads it as a
- * plain number. */
+/* True if every field has its row, and every reference to a place has the meaning OFFSET or UNUSED, so that it is not
+ * taken for a plain number. */
 consteval bool rows_match(std::span<const field> fields, std::span<const field_fact> facts) {
     if (fields.size() != facts.size())
         return false;
@@ -43,8 +44,7 @@ consteval bool rows_match(std::span<const field> fields, std::span<const field_f
     return true;
 }
 
-/* The fact rows of a record. A record whose rows do not match its fields cannot be made a format, and so not compile.
- */
+/* The fact rows of a record. If a record's rows do not match its fields, this does not compile. */
 template <class Record>
 consteval record_format describe(std::string_view record, std::span<const field_fact> facts,
                                  std::size_t size = sizeof(Record)) {
@@ -61,7 +61,7 @@ consteval record_format describe(std::string_view record, std::span<const field_
     return made;
 }
 
-/* By record type. */
+/* The formats by record type. */
 template <class Record> inline constexpr record_format format_for = {};
 #define CDB_RECORD(type, ...)                                                                                          \
     template <> inline constexpr record_format format_for<type> = describe<type>(#type, __VA_ARGS__)
@@ -89,7 +89,7 @@ CDB_RECORD(vx_structured_data_t, facts::structured_data, offsetof(vx_structured_
 CDB_RECORD(vx_structured_data_element_t, facts::structured_data_element);
 #undef CDB_RECORD
 
-/* All of them. (Structured byte strings and context templates are laid down, but in no file.) */
+/* All of them. (Structured byte strings and context templates are declared, but no file contains them.) */
 inline constexpr const record_format *record_formats[] = {
     &format_for<orb_cdb_header_t>,
     &format_for<cdb_dsect_anchor_t>,

@@ -11,7 +11,7 @@ namespace cdb {
 struct section_kind {
     cdb_dsect_type_t type;
     std::string_view spelling;
-    const record_format *root = nullptr; /* the record at its start; null: no file has such a section */
+    const record_format *root = nullptr; /* the record at its start; null: files have no such sections */
     std::string_view key = {};           /* in JSON */
     std::string_view title = {};         /* in words */
     std::string_view stanza = {};        /* the kind of its record, as a source and a comparison call it */
@@ -40,7 +40,7 @@ consteval bool kinds_are_by_type() {
 }
 static_assert(kinds_are_by_type());
 
-/* The kind of a section that a file may have; null for any other type. */
+/* The kind of sections of this type; null if files have no such sections. */
 constexpr const section_kind *kind_of(std::uint32_t type) {
     bool known = type < std::size(section_kinds) && section_kinds[type].root != nullptr;
     return known ? &section_kinds[type] : nullptr;
@@ -55,7 +55,7 @@ constexpr cdb_dsect_type_t type_of_rank(int rank) {
 
 /* ---- The tables of a class ------------------------------------------------------------------------------------- */
 
-/* How a table goes into the file. */
+/* How a table is written to the file. */
 enum class table_form : std::uint8_t {
     LOCATED,   /* its offset is recorded */
     UNLOCATED, /* deliberately not */
@@ -72,14 +72,14 @@ struct side_table {
     const char *trace_name;            /* as the compiler's traces call it */
     std::size_t growth;                /* bytes by which the compiler lets it grow */
     int made;                          /* its place in the order in which the compiler makes them */
-    int counted; /* its place in the order in which the compiler counts them, which decides which of two tables that are
-                    too large it names; NOT_COUNTED: the record does not say how large it is, or deliberately says 0 */
+    int counted; /* its place in the order in which the compiler counts them. If several tables are too large, it names
+                  * the first of them. NOT_COUNTED: the record does not hold its size, or deliberately holds 0 */
     table_form form = table_form::LOCATED;
     std::string_view key = {};    /* in JSON */
     std::string_view title = {};  /* of a record, in words */
     std::string_view stanza = {}; /* of a record */
 
-    /* The size of the table in bytes, as the class record says it; 0 for the strings, which say none. */
+    /* The size of the table in bytes according to the class record; 0 for the strings, whose size is not recorded. */
     constexpr std::uint64_t size_in(const rsrc_class_t &rc) const {
         return count != nullptr ? std::uint64_t{rc.*count} * record->size : bytes != nullptr ? rc.*bytes : 0;
     }
@@ -119,7 +119,7 @@ inline constexpr side_table side_tables[] = {
      table_form::ROUNDED},
 };
 
-/* The first so many of them are tables of records; the first four, of attributes. */
+/* How many of these are tables of records. They come first, and the first four are tables of attributes. */
 inline constexpr std::size_t TABLES_OF_RECORDS = static_cast<std::size_t>(std::count_if(
     std::begin(side_tables), std::end(side_tables), [](const side_table &t) { return t.count != nullptr; }));
 inline constexpr std::size_t TABLES_OF_ATTRIBUTES = 4;

@@ -12,8 +12,8 @@ static bool is_bound(const field &f) {
 }
 
 /* An attribute that a following class cut short is the last of its table, in a class that is not the last. Its
- * reference to valid values may be 0 and mean nothing; only a persistent class attribute says "none" from the start.
- * The bounds of a resource attribute may be the range of a class attribute, and of its type. */
+ * reference to valid values may be 0 without a meaning; only in a persistent class attribute it is "none" from the
+ * start. The bounds of a resource attribute may be the range of a class attribute, with that attribute's type. */
 template <class Record>
 void attribute_walk::follow(const location &place, std::size_t offset, const Record &record, vx_uint32_t id,
                             bool may_be_cut_short) {
@@ -111,7 +111,7 @@ void attribute_walk::check_structure_value(const location &place, const field &f
 
 /* ---- Doubts ---------------------------------------------------------------------------------------------------- */
 
-/* The position of the attribute, among those in doubt, that has the first list of valid values. */
+/* Among the attributes in doubt, the position of the one that owns the first list of valid values. */
 std::optional<std::size_t> attribute_walk::owner_of_doubtful_lists() const {
     if (tables.valid_vals.number<vx_uint32_t>(0) != CDB_ID_VALID_VALUES)
         return std::nullopt;

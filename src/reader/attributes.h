@@ -20,12 +20,12 @@ public:
     template <class Record>
     void walk(const cdb_ref_t &table, std::size_t count, std::string_view record, vx_uint32_t id);
 
-    /* Decides whose the first list of valid values and the bounds in doubt are. Call it when all other references have
+    /* Decides who owns the first list of valid values and the bounds in doubt. Call it when all other references have
      * been followed and all texts claimed. */
     void decide_doubtful();
 
 private:
-    /* A reference to the first list of valid values that may mean that there is none. */
+    /* A reference to the first list of valid values that may actually mean "none". */
     struct doubtful_list {
         location attribute_at;
         const field *what;

@@ -35,7 +35,7 @@ private:
     attribute_walk attributes;
 };
 
-/* The field of the class record that says where a table is. */
+/* The field of the class record that holds the offset of a table. */
 const field &ref_field(const side_table &table) {
     static const rsrc_class_t record = {};
     const void *ref = &(record.*table.ref);
@@ -87,7 +87,7 @@ void class_walk::walk_actions(const cdb_ref_t &table, std::size_t count, vx_uint
     }
 }
 
-/* The compiler makes none, so what identifies them is not known. */
+/* The compiler writes no such records, so their identifiers are not known. */
 void class_walk::walk_errors() {
     std::size_t offset = rc.u_rc_errors.offset[0];
     std::size_t count = count_placed(section, rc.u_rc_errors, rc.rc_num_errors, sizeof(rsrc_error_t));
@@ -106,7 +106,7 @@ void class_walk::walk_depends() {
         out.visit<rsrc_depend_t>(place, section, offset);
 }
 
-/* References that may mean nothing wait until everything with a certain owner is claimed. */
+/* References that may have no meaning are decided when everything with a certain owner has been claimed. */
 void class_walk::run() {
     out.visit<rsrc_class_t>(at, section, 0);
     out.expect_id(at, fields_of<rsrc_class_t>.front().name, rc.rc_cb_ID, CDB_ID_CLASS);

@@ -1,4 +1,4 @@
-/* diagnosis.cpp: tells causes from consequences. */
+/* diagnosis.cpp: distinguishes causes from consequences. */
 
 #include "reader/diagnosis.h"
 
@@ -29,8 +29,8 @@ bool is_error(const finding &f) {
     return f.broken->level == severity::error;
 }
 
-/* Each cause in the order of the findings, and its consequences after it. causes: of each finding, the position of its
- * cause. */
+/* Orders the findings: each cause in its place, followed by its consequences. causes: for each finding, the position of
+ * its cause. */
 std::vector<diagnosed> arranged(std::vector<finding> &&found, std::span<const std::size_t> causes) {
     std::vector<std::size_t> order(found.size());
     std::iota(order.begin(), order.end(), std::size_t{0});
@@ -62,7 +62,7 @@ std::string shown(const bytes &file, std::size_t offset, std::size_t size) {
     }
 }
 
-/* What the file has where a repair corrected it: a number, or one byte of something longer. */
+/* The contents of the file where a repair corrected it: a number, or one byte of something longer. */
 region corrected_region(const repair &repaired) {
     std::size_t offset = repaired.offset();
     std::vector<region> all = regions(repaired.corrected());
@@ -91,7 +91,7 @@ auto key_of(const finding &f) {
 
 using finding_key = decltype(key_of(std::declval<finding>()));
 
-/* Those of the findings that the corrected database has too. */
+/* The findings that the corrected database has too. */
 std::set<finding_key> remaining(const database &corrected, std::span<const finding> found) {
     std::set<finding_key> before, stay;
     for (const finding &f : found)
@@ -103,7 +103,7 @@ std::set<finding_key> remaining(const database &corrected, std::span<const findi
     return stay;
 }
 
-/* The warnings that the corrected database has too are nothing of it. */
+/* Warnings that the corrected database has too are not consequences. */
 std::vector<diagnosed> caused_by_one(const database &db, std::vector<finding> &&found, const repair &repaired) {
     region at = corrected_region(repaired);
     auto cause = std::find_if(found.begin(), found.end(),
@@ -121,7 +121,7 @@ std::vector<diagnosed> caused_by_one(const database &db, std::vector<finding> &&
 
 /* ---- Causes by rule --------------------------------------------------------------------------------------------- */
 
-/* Whether what this error is about leads to other bytes, which are then wrong as well. */
+/* True if this error is about something that leads to other bytes, which are then wrong as well. */
 bool leads_astray(const finding &f) {
     for (check rule :
          {check::SECTION_OUTSIDE, check::SECTION_PLACE, check::SECTION_TYPE, check::SECTION_LENGTH, check::TABLE_PLACE,
@@ -161,7 +161,7 @@ private:
         return at == of_section.end() ? std::nullopt : std::optional(at->second);
     }
 
-    std::map<std::size_t, std::size_t> of_section; /* the first error that leads astray */
+    std::map<std::size_t, std::size_t> of_section; /* the first error that makes later findings its consequences */
     std::optional<std::size_t> first;              /* of all sections */
     std::optional<std::size_t> displaced;          /* the latest section that is not where the one before it ends */
 };

@@ -6,26 +6,27 @@
 
 namespace cdb {
 
-/* Code of a number that no rule of verify() is about, and that everything found contradicts. */
+/* The code for a number that no rule of verify() is about, but that contradicts the rest of the file. */
 inline constexpr std::string_view CODE_CONTRADICTING = "CDB108";
 
-/* Its rule. It is not among rules(), since verify() sees only what contradicts such a number. */
+/* The rule of that code. It is not among rules(), because verify() cannot find such a number, only the contradictions.
+ * */
 const rule &contradicting_rule();
 
 /* A finding, and which one it is a consequence of. */
 struct diagnosed {
     finding found;
-    std::size_t cause; /* position of its cause in the diagnosis; its own position: it is a cause */
+    std::size_t cause; /* position of its cause in the diagnosis; a cause has its own position here */
 };
 
 /* What verify() finds, each cause followed by its consequences.
  *
  * If there are several errors and one corrected number of the file removes all of them, the number is the cause of all:
- * the finding at its field, or, if there is none, one of CODE_CONTRADICTING. Numbers that are tried: one that makes the
- * checksum right, or one that a finding or a neighbouring table expects.
+ * the finding at its field, or, if there is none, one of CODE_CONTRADICTING. The numbers that are tried are those that
+ * would make the checksum right, and those that a finding or a neighbouring table expects.
  *
- * Otherwise an error in a reference, a list, a table or a section is the cause of what is found in the same section
- * after it, and the first error that of a wrong checksum.
+ * Otherwise an error in a reference, a list, a table or a section is the cause of the later findings in the same
+ * section, and the first error is the cause of a wrong checksum.
  *
  * Takes the time of verify(), and if there are several errors that of some hundred more, but for at most 64 MB. */
 std::vector<diagnosed> diagnose(const database &db);

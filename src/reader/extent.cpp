@@ -22,7 +22,8 @@ extent::claim_result extent::claim(std::size_t at, std::size_t length) {
     return claim_result::FIRST;
 }
 
-/* Whether one of eight bytes is zero: where none is, taking 1 from each sets no highest bit that was not set. */
+/* True if one of eight bytes is zero. If none is, subtracting 1 from each byte sets no highest bit that was clear
+ * before. */
 static bool has_zero(const std::byte *unit) {
     constexpr std::uint64_t ONES = 0x0101010101010101;
     std::uint64_t word = 0;

@@ -15,17 +15,17 @@ public:
 
     extent(const bytes &covered, std::size_t file_offset);
 
-    /* Claims length bytes, all inside the area, from at on, a multiple of UNIT. AGAIN: an earlier claim starts at the
-     * same place. Takes time in proportion to what it newly claims. */
+    /* Claims length bytes, all inside the area, that start at `at`, a multiple of UNIT. Returns AGAIN if an earlier
+     * claim starts at the same place. Takes time proportional to the bytes that it claims. */
     claim_result claim(std::size_t at, std::size_t length);
 
     struct text_claim {
         std::size_t size; /* bytes claimed */
-        bool whole;       /* the text's zero byte is one of them; if not, the text runs into something else, or to its
-                             limit */
+        bool whole;       /* true: the text's zero byte is one of them; false: the text runs into something else, or to
+                           * its limit */
     };
-    /* Claims a text that ends before the place end. at is a multiple of UNIT. Takes time in proportion to what it
-     * claims. */
+    /* Claims a text that starts at `at`, a multiple of UNIT, and ends before `end`. Takes time proportional to the
+     * bytes that it claims. */
     text_claim claim_text(std::size_t at, std::size_t end);
 
     /* at < area.size() */
@@ -40,7 +40,7 @@ public:
     bool is_text(std::size_t at) const {
         return (marks[at / UNIT] & TEXT) != 0;
     }
-    /* Where the first noted text from at on starts; the size of the area if there is none. */
+    /* The start of the first noted text at `at` or after it; the size of the area if there is no such text. */
     std::size_t next_text(std::size_t at) const;
 
     static constexpr std::size_t units(std::size_t size) {

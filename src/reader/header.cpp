@@ -1,4 +1,4 @@
-/* header.cpp: what verification checks of the file as a whole. */
+/* header.cpp: checks the file as a whole. */
 
 #include "reader/header.h"
 
@@ -23,8 +23,8 @@ void check_length(reporter &out, const database &db) {
                    text::hex(db.header().cdb_hdr_format), text::hex(CDB_FORMAT));
 }
 
-/* XOR depends neither on the order of words nor on that of their bytes. So the words are taken as they are stored,
- * eight at a time, and the caller puts the bytes of the result in order. */
+/* The result of XOR depends neither on the order of the words nor on their byte order. So the words are used as they
+ * are stored, eight at a time, and the caller puts the bytes of the result in order. */
 std::uint32_t xor_of_words(std::span<const std::byte> words, const std::byte *first_word) {
     std::array<std::uint32_t, 8> sums = {}, some = {};
     auto add = [&](const std::byte *from, std::size_t size) {

@@ -1,4 +1,4 @@
-/* owners.cpp: the ownership in a database of which verification is asked nothing else. */
+/* owners.cpp: the ownership in a database, for callers that need no findings. */
 
 #include "reader/owners.h"
 

@@ -1,4 +1,4 @@
-/* owners.h: the ownership in a database of which verification is asked nothing else. */
+/* owners.h: the ownership in a database, for callers that need no findings. */
 #ifndef CDGEN_READER_OWNERS_H
 #define CDGEN_READER_OWNERS_H
 

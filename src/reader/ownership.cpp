@@ -1,4 +1,4 @@
-/* ownership.cpp: whose a list of valid values or a bound is, where the reference alone does not say. */
+/* ownership.cpp: decides who owns a list of valid values or a bound if the reference alone does not show it. */
 
 #include "reader/ownership.h"
 

@@ -1,4 +1,4 @@
-/* references.cpp: the walk over whatever a class's records refer to. */
+/* references.cpp: the walk over everything that a class's records refer to. */
 
 #include "reader/references.h"
 
@@ -31,8 +31,8 @@ bool reference_walk::take_found_shared() {
 
 /* ---- Fields ---------------------------------------------------------------------------------------------------- */
 
-/* A source can leave an element's type unknown, and a following class an attribute's. Structured byte strings are
- * types, but have no values. */
+/* An element's type is unknown if the source gives an unknown name, and an attribute's if a following class cut it
+ * short. Structured byte strings are types, but have no values. */
 void reference_walk::expect_data_type(const location &place, const field &f, vx_data_type_t type) {
     if (!is_data_type(type))
         out.report(check::DATA_TYPE, place, f.name, place.offset + f.offset, std::to_string(type), "0 to 22");
@@ -73,7 +73,7 @@ void reference_walk::follow_reference(const location &place, const field &f, std
 
 /* ---- Lists ----------------------------------------------------------------------------------------------------- */
 
-/* Where the entries of a list start, if there is a list and it has no other owner. */
+/* The start of a list's entries, if there is a list and it has no other owner. */
 std::optional<std::size_t> reference_walk::find_list(const location &place, const field &ref, std::uint32_t offset,
                                                      extent &lists, const list_kind &kind) {
     auto refuse = [&](check broken, std::string expected) {
@@ -102,8 +102,8 @@ std::optional<std::size_t> reference_walk::find_list(const location &place, cons
     return refuse(check::LIST_SHARED, "a list of its own");
 }
 
-/* Claims a list that lies inside its table; false if some of it has an owner. An empty list has room for one entry, if
- * the table has. */
+/* Claims a list that is inside its table. Returns false if some of its bytes have an owner. An empty list takes the
+ * room of one entry, unless the table ends before. */
 bool reference_walk::claim_list(const location &list_at, std::size_t count, extent &lists, const list_kind &kind) {
     std::size_t first = list_at.index + LIST_HEAD;
     std::size_t held = count == 0 && lists.area.size() - first >= kind.entry->size ? 1 : count;

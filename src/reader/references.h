@@ -1,4 +1,5 @@
-/* references.h: the walk over whatever a class's records refer to: texts, values and the lists of its side tables. */
+/* references.h: the walk over everything that a class's records refer to: texts, values and the lists of its side
+ * tables. */
 #ifndef CDGEN_READER_REFERENCES_H
 #define CDGEN_READER_REFERENCES_H
 
@@ -15,8 +16,8 @@ public:
     reference_walk(const reference_walk &) = delete;
     reference_walk &operator=(const reference_walk &) = delete;
 
-    /* Follows the leading fields of a record at an offset of an area. owner_type: the type of its values, which such a
-     * record does not name itself. */
+    /* Follows the references and values of a record at an offset of an area. owner_type: the type of its values, if the
+     * record itself does not name it. */
     void follow(const location &place, const bytes &area, std::size_t offset, std::span<const field> fields,
                 vx_data_type_t owner_type);
     void follow_field(const location &place, const field &f, std::uint32_t word, vx_data_type_t type);
@@ -26,7 +27,7 @@ public:
     /* Reports the bytes in list tables that nothing refers to. A source can leave such lists. */
     void report_unreached();
 
-    /* Whether a list or a value that an earlier record had claimed was met since the last call. */
+    /* True if, since the last call, a reference led to a list or a value that an earlier record had claimed. */
     bool take_found_shared();
 
     const class_tables &tables;

@@ -1,4 +1,4 @@
-/* region_map.cpp: what each stretch of a file is. */
+/* region_map.cpp: the meaning of each stretch of a file. */
 
 #include "reader/region_map.h"
 
@@ -18,7 +18,7 @@ bool is_record(std::uint8_t kind) {
     return kind < stretch_kind::TEXT;
 }
 
-/* The size of one of those that can follow each other; 0 for what cannot. */
+/* The size of one item, for kinds whose items can follow each other; 0 for other kinds. */
 std::size_t unit_of(std::uint8_t kind) {
     if (is_record(kind))
         return record_formats[kind]->size;

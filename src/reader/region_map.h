@@ -1,4 +1,5 @@
-/* region_map.h: what each stretch of a file is, collected in any order and handed over in the order of the file. */
+/* region_map.h: the meaning of each stretch of a file, collected in any order and passed on in the order of the file.
+ * */
 #ifndef CDGEN_READER_REGION_MAP_H
 #define CDGEN_READER_REGION_MAP_H
 
@@ -10,7 +11,7 @@
 
 namespace cdb {
 
-/* What a stretch is: a record, by its position in record_formats, or one of those after them. */
+/* The kind of a stretch: a record, by its position in record_formats, or one of the values after those. */
 namespace stretch_kind {
 inline constexpr std::uint8_t TEXT = std::size(record_formats);
 inline constexpr std::uint8_t LENGTH = TEXT + 1;
@@ -30,8 +31,9 @@ constexpr std::uint8_t kind_of_record(const record_format &format) {
     return kind;
 }
 
-/* The regions of one part of a file: of its header and anchors, or of a section. A record takes 20 bytes however many
- * fields it has, and so do values or records that follow each other: there may be as many as the file has words. */
+/* The regions of one part of a file: of its header and anchors, or of a section. A record takes 20 bytes of memory,
+ * however many fields it has, and so does a sequence of values or records, because a file may have as many of them as
+ * it has words. */
 class region_map {
 public:
     using taker = std::function<void(const region &)>;
@@ -39,8 +41,8 @@ public:
     /* file_size: in bytes. */
     region_map(std::size_t file_size, const taker &to) : size(file_size), take(to) {}
 
-    /* Begins a part, whose regions are no longer than 4 GB away from its start. section: position among the anchors;
-     * nothing if each anchor is its own. */
+    /* Begins a part, whose regions are at most 4 GB away from its start. section: position among the anchors; no value
+     * for the part with the anchors, each of which belongs to its own section. */
     void begin_part(std::optional<std::size_t> part_section, std::size_t part_start) {
         section = part_section;
         start = part_start;
@@ -49,11 +51,11 @@ public:
     /* offset: in the file. index: of the record in its table, or of the entry in its list. */
     void add(std::uint8_t kind, std::size_t offset, std::size_t length, std::size_t index);
 
-    /* Hands over the regions of the part, and what lies unreached before them. Where two overlap, the one that starts
-     * first counts; of two that start together the longer one; of two that are as long, the one that was added first.
-     */
+    /* Passes on the regions of the part, and the unreached bytes before and between them. If two regions overlap, the
+     * one that starts first wins; if they start together, the longer one; if they have the same length, the one that
+     * was added first. */
     void finish_part();
-    /* Hands over what lies unreached after the last region. */
+    /* Passes on the unreached bytes after the last region. */
     void finish();
 
 private:
@@ -65,7 +67,7 @@ private:
         std::uint8_t kind;
     };
 
-    /* The next region of a stretch whose regions are being handed over. */
+    /* The next region of a stretch whose regions are being passed on. */
     class cursor;
 
     bool stands_alone(const std::deque<stretch>::const_iterator &one) const;
@@ -77,7 +79,7 @@ private:
     const taker &take;
     std::optional<std::size_t> section;
     std::size_t start = 0;
-    std::size_t end = 0; /* of the regions that were handed over */
+    std::size_t end = 0; /* of the regions that were passed on */
     std::deque<stretch> stretches;
 };
 

@@ -1,4 +1,4 @@
-/* repair.cpp: tries numbers that might be right until no error is left. */
+/* repair.cpp: tries numbers that might be correct until no error is left. */
 
 #include "reader/repair.h"
 
@@ -20,7 +20,7 @@ bool breaks(const finding &f, check rule) {
     return f.broken == &rule_of(rule);
 }
 
-/* What a finding shows, if that is a number. */
+/* The number that a finding shows, if it is a number. */
 std::optional<std::uint64_t> number_in(std::string_view shown) {
     int base = shown.starts_with("0x") ? 16 : 10;
     shown.remove_prefix(base == 16 ? 2 : 0);
@@ -30,7 +30,7 @@ std::optional<std::uint64_t> number_in(std::string_view shown) {
     return whole ? std::optional(number) : std::nullopt;
 }
 
-/* How much larger the number that a finding shows is than the one that is expected. */
+/* The difference between the number that a finding shows and the expected one. */
 std::optional<std::int64_t> excess_of(const finding &f) {
     auto found = number_in(f.found), expected = number_in(f.expected);
     if (!found || !expected)
@@ -38,7 +38,7 @@ std::optional<std::int64_t> excess_of(const finding &f) {
     return static_cast<std::int64_t>(*found - *expected);
 }
 
-/* Whether there are no errors, and no more than so many warnings. Ends at the finding that is too much. */
+/* True if there are no errors and at most this many warnings. Stops verifying at the first finding too many. */
 bool has_only_warnings(const database &db, std::size_t most) {
     struct too_much {};
     std::size_t warnings = 0;
@@ -102,8 +102,8 @@ std::size_t repair::offset() const {
 
 /* ---- One number ------------------------------------------------------------------------------------------------- */
 
-/* No error is left. If the checksum is the only error, other words than the wrong one make it right too: then the wrong
- * one removes a warning as well. */
+/* True if no error is left. If the checksum is the only error, a change of any word can make it right, so the corrected
+ * word must also remove a warning. */
 bool repair::is_better() const {
     if (!only_sum_is_wrong)
         return has_only_warnings(corrected(), std::numeric_limits<std::size_t>::max());
@@ -155,7 +155,7 @@ bool repair::try_sum(std::size_t offset) {
 
 /* ---- Numbers that others say ------------------------------------------------------------------------------------ */
 
-/* The length is what the checksum is taken of, and the format word says the byte order. */
+/* The checksum covers as many bytes as the length says, in the byte order that the format word shows. */
 bool repair::try_header() {
     if (try_number(offsetof(orb_cdb_header_t, cdb_hdr_length), WORD, copy.size() - WORD))
         return true;
@@ -175,7 +175,7 @@ bool repair::try_expected(const finding &f) {
     return expected && at != fields.end() && try_number(f.offset, std::min<std::size_t>(at->width, WORD), *expected);
 }
 
-/* What begins in the wrong place may follow something of the wrong size. */
+/* If something begins in the wrong place, the size of the thing before it may be wrong. */
 bool repair::try_neighbour(const finding &f) {
     std::optional<std::int64_t> excess = excess_of(f);
     if (breaks(f, check::SECTION_PLACE) && f.field.empty())
@@ -197,7 +197,7 @@ bool repair::try_last_length() {
                                                 copy.size() - db.anchor(last).cda_offset);
 }
 
-/* Of the tables before one that begins in the wrong place, each may have the wrong size. missing: bytes. */
+/* Each of the tables before one that begins in the wrong place may have the wrong size. missing: in bytes. */
 bool repair::try_table_before(const finding &f, std::int64_t missing) {
     if (!f.section || f.record != format_for<rsrc_class_t>.record)
         return false;

@@ -1,4 +1,4 @@
-/* repair.h: looks for the one number of a damaged database that is to blame for all of its errors. */
+/* repair.h: looks for one number in a damaged database that causes all of its errors. */
 #ifndef CDGEN_READER_REPAIR_H
 #define CDGEN_READER_REPAIR_H
 
@@ -8,10 +8,10 @@ namespace cdb {
 
 class repair {
 public:
-    /* found: what verify() says of the database. Both must stay as long as this. */
+    /* found: the findings of verify(). Both arguments must outlive this object. */
     repair(const database &damaged, std::span<const finding> found);
 
-    /* Whether one corrected word leaves no error. */
+    /* True if correcting one word removes all errors. */
     bool succeeds();
 
     /* The corrected file, and where its first corrected byte is; after succeeds(). */

@@ -1,4 +1,4 @@
-/* report.cpp: what the walk over a database reports. */
+/* report.cpp: collects what the walk over a database reports. */
 
 #include "reader/report.h"
 

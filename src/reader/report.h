@@ -1,5 +1,5 @@
-/* report.h: what the walk over a database reports: which rules are broken, and, if asked to, what each stretch of the
- * file is. */
+/* report.h: collects what the walk over a database reports: which rules are broken and, on request, the meaning of each
+ * stretch of the file. */
 #ifndef CDGEN_READER_REPORT_H
 #define CDGEN_READER_REPORT_H
 
@@ -24,7 +24,7 @@ inline bool all_zero(std::span<const std::byte> stretch) {
     return word == 0 && std::all_of(stretch.begin(), stretch.end(), [](std::byte b) { return b == std::byte{0}; });
 }
 
-/* Is handed each finding when it is made. */
+/* Called with each finding as soon as it is made. */
 using finding_taker = std::function<void(finding &&)>;
 
 class reporter {
@@ -39,7 +39,7 @@ public:
     void report(check broken, const location &at, std::string_view field, std::size_t offset, std::uint64_t found,
                 std::uint64_t expected);
 
-    /* Both at a field of the record that is there. */
+    /* Both are about a field of the record at this place. */
     void report(check broken, const location &at, const field &f, std::string found, std::string expected) {
         report(broken, at, f.name, at.offset + f.offset, std::move(found), std::move(expected));
     }
@@ -65,14 +65,15 @@ public:
         if (found != expected)
             report_id(at, field, found, expected);
     }
-    /* Reports the first of the bytes that is not zero, if there is one. file_offset: of the bytes. */
+    /* Reports the first of the bytes that is not zero, if any. file_offset: of the first byte. */
     void expect_zero(const location &at, std::string_view field, const bytes &area, std::size_t offset,
                      std::size_t length, std::size_t file_offset) {
         if (auto stretch = area.part(offset, length).raw(); !all_zero(stretch))
             report_reserved(at, field, stretch, file_offset);
     }
 
-    /* While this is set, errors are reported as this warning: the compiler can make them of a careless source. */
+    /* While this is set, errors are reported as this warning, because the compiler can make them from a careless
+     * source. */
     std::optional<check> excuse;
 
 private:

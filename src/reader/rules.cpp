@@ -1,4 +1,4 @@
-/* rules.cpp: what verification checks. */
+/* rules.cpp: the rules that verification checks. */
 
 #include "reader/rules.h"
 

@@ -12,11 +12,12 @@ public:
     text_walk(reporter &to, const location &section_at, const bytes &strings_area, std::size_t file_offset)
         : strings(strings_area, file_offset), out(to), section(section_at.section) {}
 
-    /* Visits the text that a record's reference leads to. may_be_unset: a name at 0 may not have been given at all;
-     * other references at 0 always may. Then the reference does not own the text that is stored at 0. */
+    /* Visits the text that a record's reference leads to. may_be_unset: true if the source may not have given the name,
+     * so that its reference is 0; for other texts this is always possible. Such a reference does not own the text that
+     * is stored at 0. */
     void visit(const location &at, const field &ref, std::uint32_t offset, bool may_be_unset);
-    /* Notes a text at a multiple of extent::UNIT inside the strings. While errors are excused the text is claimed at
-     * once: all other texts are known by then, and it may begin amid something else. */
+    /* Notes a text at a multiple of extent::UNIT inside the strings. While errors are excused, the text is claimed at
+     * once, because all other texts are known by then and it may begin in the middle of one. */
     void note(std::size_t offset);
     /* Claims all noted texts. A text ends at its zero byte but may not run into the next text, so all starts are
      * collected before any text is claimed. */
@@ -29,7 +30,7 @@ private:
 
     reporter &out;
     std::optional<std::size_t> section;
-    bool is_first_referred_to = false; /* by a reference that may as well mean that there is none */
+    bool is_first_referred_to = false; /* by a reference that may also mean "none" */
 };
 
 } // namespace cdb

@@ -32,7 +32,7 @@ void value_walk::walk(const cell_location &cell, std::uint32_t offset, vx_data_t
     --nesting;
 }
 
-/* Claims length bytes from offset on. False, and reported, if they lie outside or belong to another value. */
+/* Claims length bytes from offset on. Returns false, and reports it, if they are outside or belong to another value. */
 bool value_walk::claim(const cell_location &cell, std::size_t offset, std::uint64_t length) {
     if (!strings.area.holds(offset, length)) {
         out.report(check::VALUE_OUTSIDE, cell.record, cell.field, cell.offset,
@@ -62,7 +62,7 @@ void value_walk::walk_filling(const location &place, std::size_t end) {
     out.add_region(place, strings.offset + end, rounded - end, stretch_kind::FILLING);
 }
 
-/* The length and the bytes are two pieces. */
+/* The length and the bytes are stored as two separate pieces. */
 void value_walk::walk_binary(const cell_location &cell, std::size_t offset) {
     auto length = strings.area.number<std::uint32_t>(offset);
     if (!claim(cell, offset, value::BINARY_BYTES + std::uint64_t{length}))
@@ -110,7 +110,8 @@ void value_walk::walk_array(const cell_location &cell, std::size_t offset, vx_da
     }
 }
 
-/* Texts and binaries have no bounds: in an array of them that is a bound the compiler writes none, or fills no cell. */
+/* Texts and binaries have no bounds. In the array of such a bound the compiler writes "none", or does not fill the
+ * cell. */
 void value_walk::walk_element(const location &element, std::uint32_t offset, vx_data_type_t type) {
     bool is_bound = out.excuse == check::RANGE_ASTRAY;
     if (!is_bound || (type != VX_CHAR_PTR && type != VX_BINARY_PTR))

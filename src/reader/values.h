@@ -21,11 +21,11 @@ public:
     /* Follows a cell of an out-of-line type. offset: the cell's first word. */
     void walk(const cell_location &cell, std::uint32_t offset, vx_data_type_t type);
 
-    /* Some binaries without bytes have a second piece all the same, of zeros. Claims those pieces that nothing else
-     * has claimed: call it last. */
+    /* Some binaries without bytes have a second piece nevertheless, of zeros. Claims those pieces that nothing else has
+     * claimed, so call it last. */
     void finish_empty_binaries();
 
-    bool found_shared = false; /* a value that another record had claimed; whoever asks resets it */
+    bool found_shared = false; /* true: a value was met that another record had claimed; the caller resets it */
 
 private:
     bool claim(const cell_location &cell, std::size_t offset, std::uint64_t length);

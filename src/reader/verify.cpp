@@ -1,5 +1,5 @@
-/* verify.cpp: the one walk over a database that verification and the map of its regions share. It visits whatever the
- * header leads to once. */
+/* verify.cpp: the one walk over a database that verification and the map of its regions share. It visits everything
+ * that can be reached from the header once. */
 
 #include "format/sections.h"
 #include "reader/class.h"
@@ -33,9 +33,9 @@ private:
 
     const database &db;
     reporter out;
-    region_map *regions;               /* null: none are wanted */
+    region_map *regions;               /* null: no regions are wanted */
     std::size_t last_class;            /* position of the last class among the anchors */
-    std::size_t sections_end = 0;      /* where the sections walked so far end, in the file */
+    std::size_t sections_end = 0;      /* end of the sections walked so far, in the file */
     int section_rank = 0;              /* the highest so far, in the order of types */
     std::vector<var_id_t> dynamic_ids; /* of the classes before the first variable class */
     bool dynamic_ids_sorted = false;   /* a variable class was met */
@@ -49,8 +49,8 @@ std::size_t file_walk::find_last_class(const database &db) {
     return last;
 }
 
-/* Sections follow each other without gaps. One that overlaps those before it is not walked: the work must not depend on
- * how many anchors lead to the same bytes. */
+/* Sections follow each other without gaps. A section that overlaps earlier ones is not walked, because the work must
+ * not depend on how many anchors lead to the same bytes. */
 bool file_walk::place_section(const location &at, const cdb_dsect_anchor_t &anchor) {
     const field &placed = field_of<cdb_dsect_anchor_t>(offsetof(cdb_dsect_anchor_t, cda_offset));
     if (!db.file().holds(anchor.cda_offset, anchor.cda_length)) {

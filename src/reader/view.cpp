@@ -25,7 +25,7 @@ std::error_code system_error() {
     return {errno != 0 ? errno : EIO, std::generic_category()};
 }
 
-/* The byte order in which the format word reads as it must. */
+/* The byte order in which the format word is correct. */
 std::optional<std::endian> order_of(std::span<const std::byte> file) {
     for (std::endian order : {std::endian::little, std::endian::big})
         if (bytes(file, order).number<std::uint32_t>(offsetof(orb_cdb_header_t, cdb_hdr_format)) == CDB_FORMAT)
@@ -35,8 +35,8 @@ std::optional<std::endian> order_of(std::span<const std::byte> file) {
 
 constexpr std::size_t STEP = 65536; /* bytes read at a time */
 
-/* Asks for large pages wherever they fit into a stretch: the system takes longer to hand out small ones than the caller
- * to fill them. */
+/* Asks for large pages wherever they fit into the memory, because providing small pages takes the system longer than
+ * filling them takes the caller. */
 void advise_large_pages([[maybe_unused]] std::byte *start, [[maybe_unused]] std::size_t size) {
 #ifdef MADV_HUGEPAGE
     constexpr std::size_t LARGE_PAGE = 2097152;
@@ -46,8 +46,9 @@ void advise_large_pages([[maybe_unused]] std::byte *start, [[maybe_unused]] std:
 #endif
 }
 
-/* Reads until the end of the file, whatever its size was said to be; with the right size, no byte is moved. The steps
- * are small so that their new bytes, zero at first, are still in the nearest cache when they are read into. */
+/* Reads until the end of the file, even if the expected size was wrong; if it was right, no byte is moved. The steps
+ * are small so that the new bytes, which are cleared first, are still in the fastest cache when the file is read into
+ * them. */
 std::vector<std::byte> read_all(std::FILE *file, std::uintmax_t expected) {
     std::vector<std::byte> contents;
     const std::size_t most = contents.max_size() - STEP;

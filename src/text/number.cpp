@@ -15,7 +15,7 @@ namespace text {
 
 namespace {
 
-/* All bits of the fraction but the highest, which says that a NaN is quiet. */
+/* All bits of the fraction except the highest, which marks a quiet NaN. */
 template <class Bits, class Number> Bits payload_of(Number number) {
     constexpr int FRACTION = std::numeric_limits<Number>::digits - 1;
     return std::bit_cast<Bits>(number) & ((Bits{1} << (FRACTION - 1)) - 1);

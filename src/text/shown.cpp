@@ -1,4 +1,4 @@
-/* shown.cpp: texts of unknown origin as they may be shown. */
+/* shown.cpp: makes texts of unknown origin safe to show. */
 
 #include "text/shown.h"
 #include "text/append.h"
@@ -16,8 +16,9 @@ struct range {
     char32_t last;
 };
 
-/* Characters that would steer a terminal, break a line, or hide: controls, separators, what turns the writing
- * direction, and what Unicode calls default-ignorable, which is invisible. Combining marks are visible, and pass. */
+/* Characters that control a terminal, break a line or are invisible: control characters, separators, characters that
+ * change the writing direction, and those that Unicode calls default-ignorable. Combining marks are visible, so they
+ * are not in this table. */
 constexpr range unprintable[] = {{0x0, 0x1F},        {0x7F, 0x9F},       {0xAD, 0xAD},      {0x34F, 0x34F},
                                  {0x61C, 0x61C},     {0x115F, 0x1160},   {0x17B4, 0x17B5},  {0x180B, 0x180F},
                                  {0x200B, 0x200F},   {0x2028, 0x202E},   {0x2060, 0x206F},  {0x3164, 0x3164},
@@ -50,7 +51,7 @@ void append_escaped(std::string &to, std::string_view bytes) {
         }
 }
 
-/* How many characters at the start are shown as they are for certain; nearly all are. */
+/* How many characters at the start can be shown without a closer look, which is nearly always all of them. */
 std::size_t plain_length(std::string_view bytes, std::string_view slashed) {
     auto is_plain = [slashed](char c) { return c >= ' ' && c <= '~' && slashed.find(c) == std::string_view::npos; };
     return static_cast<std::size_t>(std::find_if_not(bytes.begin(), bytes.end(), is_plain) - bytes.begin());

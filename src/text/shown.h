@@ -1,4 +1,5 @@
-/* shown.h: texts of unknown origin as they may be shown: nothing in them can steer a terminal, break a line or hide. */
+/* shown.h: makes texts of unknown origin safe to show, so that nothing in them controls a terminal, breaks a line or is
+ * invisible. */
 #ifndef CDGEN_TEXT_SHOWN_H
 #define CDGEN_TEXT_SHOWN_H
 
@@ -12,7 +13,7 @@ namespace text {
 std::size_t printable_length(std::string_view bytes);
 
 /* The text with everything escaped that is not printable UTF-8, as \n, \t, \r or \xNN: for messages. Quotes and
- * backslashes stay, so that the usual text stays as it is. */
+ * backslashes are not escaped, so that ordinary texts do not change. */
 std::string escaped(std::string_view bytes);
 
 /* The same in double quotes, with quotes and backslashes escaped too. */

@@ -12,7 +12,7 @@ namespace text {
 namespace {
 
 constexpr std::size_t CONTEXT = 3; /* lines shown before and after a change */
-constexpr std::size_t WINDOW = 64; /* lines that are looked at for a line that both texts have */
+constexpr std::size_t WINDOW = 64; /* how many lines ahead to look for a line that both texts have */
 
 using line_list = std::vector<std::string_view>;
 
@@ -27,7 +27,7 @@ line_list lines_of(std::string_view text) {
     return lines;
 }
 
-/* Lines of both texts, from the first to the one after the last. */
+/* A range of lines in both texts; the end is the line after the last. */
 struct range {
     std::size_t begin;
     std::size_t end;

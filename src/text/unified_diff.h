@@ -7,8 +7,8 @@
 
 namespace text {
 
-/* Empty if nothing changed. Meant for few changes in many lines, and takes time in proportion to the lines; with large
- * changes it may show more lines than necessary. */
+/* Returns an empty text if nothing changed. Takes time proportional to the number of lines. After large changes it may
+ * show more lines than necessary. */
 std::string unified_diff(std::string_view old_name, std::string_view new_name, std::string_view before,
                          std::string_view after);
 

@@ -13,7 +13,8 @@ std::size_t utf8_length(std::string_view bytes);
 /* The same, but 1 for a byte that starts no character; 0 only for an empty text. */
 std::size_t length_or_1(std::string_view bytes);
 
-/* The same, but as many bytes as begin one character and are cut short: what other programs replace by U+FFFD. */
+/* The same, but for the beginning of a character that is cut short, the number of its bytes. Other programs replace
+ * such bytes by one U+FFFD. */
 std::size_t length_replaced(std::string_view bytes);
 
 /* True if the text consists of well-formed characters. */

@@ -1,5 +1,5 @@
-/* attribute_order.h: guesses which attribute a line gives. Stanzas of a kind mostly give theirs in the same order, so a
- * line is first compared with the attribute that came next last time. */
+/* attribute_order.h: guesses which attribute a line gives. Stanzas of a kind mostly give their attributes in the same
+ * order, so a line is first compared with the attribute that came next in the previous stanza. */
 #ifndef CDGEN_LANGUAGE_ATTRIBUTE_ORDER_H
 #define CDGEN_LANGUAGE_ATTRIBUTE_ORDER_H
 
@@ -18,8 +18,8 @@ public:
         latest = BEGINNING;
     }
 
-    /* The attribute that came next last time, if the line begins with its name and an equals sign: then it is the
-     * stanza's latest one. Null if not. */
+    /* The attribute that came next in the previous stanza, if the line begins with its name and an equals sign; it is
+     * then noted as this stanza's latest attribute. Otherwise null. */
     const table_attrs *expected(const srtable_ctrl &kind, std::string_view line) {
         std::uint8_t position = next[latest];
         const table_attrs &attr = kind.sc_attrs[position];
@@ -30,7 +30,7 @@ public:
         return &attr;
     }
 
-    /* The attribute that the line had if it was not the expected one. */
+    /* Notes the attribute of the line if it was not the expected one. */
     void took(const srtable_ctrl &kind, const table_attrs &attr) {
         next[latest] = static_cast<std::uint8_t>(&attr - kind.sc_attrs.data());
         latest = next[latest];

@@ -18,7 +18,7 @@ constexpr auto stanza_names = [] {
 }();
 constexpr name_index stanza_index(SC_COUNT, [](std::size_t i) { return stanza_names[i]; });
 
-/* The stanzas that the assembly reaches by index instead of by name. */
+/* The kinds of stanza that the compiler finds by index instead of by name. */
 constexpr bool named(stanza_id id, std::string_view name) {
     return catalogue[id].sc_name == name;
 }
@@ -35,7 +35,7 @@ static_assert(named(SC_CLASS_ACTION, "ClassAction"), "Class Action table not fou
 
 /* ---- What every row must keep to; a row that does not will not compile ---------------------------------------- */
 
-/* A required attribute's bit is counted in another mask than an optional one's. */
+/* The bits of required and of optional attributes are in separate masks. */
 constexpr bool has_bits_of_their_own(std::span<const table_attrs> attrs) {
     vx_uint32_t required = 0;
     vx_uint32_t optional = 0;

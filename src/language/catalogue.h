@@ -46,7 +46,7 @@ enum sd_type_t {
     SD_TYPE_UNKNOWN
 };
 
-constexpr vx_uint32_t OPTIONAL = 0x80000000u; /* in req_bit: the attribute is optional */
+constexpr vx_uint32_t OPTIONAL = 0x80000000u; /* set in req_bit if the attribute is optional */
 
 /* How an attribute's text is converted and stored: an index of the value handlers. */
 enum attr_type {
@@ -90,11 +90,11 @@ struct table_attrs {
     int ta_type;         /* attr_type */
     int ta_offset;       /* of the field in the stanza's staging record */
     vx_uint32_t req_bit; /* the attribute's bit in req_mask or, with OPTIONAL added, in opt_mask */
-    int dup_allowed;     /* may be given several times in one stanza */
+    int dup_allowed;     /* true: may be given several times in one stanza */
     size_t ta_length = std::string_view(ta_name).size();
 };
 
-/* What sets the four attribute kinds apart while their lines are parsed. */
+/* The differences between the four attribute kinds while their lines are parsed. */
 struct attr_kind {
     int sd_attr_type;      /* 0 persistent, 1 dynamic */
     int value_offset;      /* ra_dflt_value or ra_init_value */
@@ -102,7 +102,7 @@ struct attr_kind {
     int max_sd_idx_offset; /* ra_max_sd_idx */
 };
 
-/* What refers to the SD section of a run; for attribute runs the attribute itself says so. */
+/* The owner of a run of elements, whose record refers to the run's SD section; in runs of attributes, the attribute. */
 struct sd_owner {
     sd_type_t type;
     cdb_ref_t rsrc_class_t::*of_class;
@@ -130,9 +130,9 @@ enum staged_record {
 
 /* The tables that a stanza's strings and lists go to. */
 enum staged_tables {
-    TABLES_OF_CLASS,          /* strings and lists: those of the open class */
+    TABLES_OF_CLASS,          /* strings and lists of the open class */
     TABLES_OF_CMMAP,          /* strings only */
-    TABLES_OF_VARIABLE_CLASS, /* strings of its own, elements with those of the open class */
+    TABLES_OF_VARIABLE_CLASS, /* strings of its own; elements in the tables of the open class */
     TABLES_COUNT
 };
 

@@ -1,5 +1,5 @@
-/* catalogue_rows.h: the rows of the catalogue, for what is derived from them while compiling. Whatever looks a name up
- * while running uses catalogue.h. */
+/* catalogue_rows.h: the rows of the catalogue, for tables that are derived from them at compile time. Code that looks a
+ * name up at run time uses catalogue.h. */
 #ifndef CDGEN_LANGUAGE_CATALOGUE_ROWS_H
 #define CDGEN_LANGUAGE_CATALOGUE_ROWS_H
 
@@ -12,7 +12,7 @@ namespace language::rows {
 inline constexpr int ONCE = 0;
 inline constexpr int REPEAT = 1;
 
-/* One attribute: the field it fills names record and member. */
+/* One attribute. The record and the member name the field that it fills. */
 #define ATTR(name, type, record, field, bit, repeat)                                                                   \
     table_attrs {                                                                                                      \
         name, type, offsetof(record, field), bit, repeat                                                               \
@@ -58,7 +58,7 @@ inline constexpr table_attrs pattr_attrs[] = {
     ATTR("GroupName", AT_UINT16, rsrc_pattr_t, ra_group_msgid, OPTIONAL | 0x2, ONCE),
     ATTR("Properties", AT_PATTR_PROPS, rsrc_pattr_t, ra_props, OPTIONAL | 0x4, ONCE),
     ATTR("ValidValue", AT_VALID_VALUE, rsrc_pattr_t, u_ra_valid_vals, OPTIONAL | 0x10, REPEAT),
-    /* The field of these three is the latest valid value's, or none. */
+    /* These three fill a field of the latest valid value, or no field. */
     ATTR("ValueDisplayName", AT_VALUE_DISPLAY, rsrc_pattr_t, u_ra_valid_vals, OPTIONAL | 0x20, REPEAT),
     ATTR("DefaultValue", AT_DEFAULT_VALUE, rsrc_pattr_t, ra_dflt_value, OPTIONAL | 0x8, REPEAT),
     ATTR("ListActionRsrc", AT_LIST_ACTION_RSRC, rsrc_pattr_t, ra_cb_ID, OPTIONAL | 0x40, ONCE),
@@ -133,8 +133,8 @@ constexpr vx_uint32_t required_mask(std::span<const table_attrs> attrs) {
     return mask;
 }
 
-/* Deliberate: these bits belong to no attribute, so that no ActionOut element is ever complete and none takes an
- * optional attribute. */
+/* Deliberate: no attribute sets these bits, so an ActionOut element is never complete and never accepts an optional
+ * attribute. */
 inline constexpr vx_uint32_t BITS_OF_NO_ATTRIBUTE = 0x20 | 0x40;
 inline constexpr vx_uint32_t ACTION_OUT_MASK = required_mask(sd_attrs) | BITS_OF_NO_ATTRIBUTE;
 

@@ -34,13 +34,13 @@ constexpr const cdb::record_format &record_of(const srtable_ctrl &stanza) {
     return cdb::format_for<sd_field_t>;
 }
 
-/* Its offset in what is staged, from which the catalogue's offsets count; in bytes. */
+/* The offset of this record in the staging record that the catalogue's offsets refer to, in bytes. */
 constexpr std::size_t record_start(const srtable_ctrl &stanza) {
     return stanza.sc_record == STAGED_SD_DEF ? offsetof(sd_def_t, sd_fields) : 0;
 }
 
-/* Whether the attribute's lines fill the field of this row. An attribute that is only checked, refused or ignored names
- * a field that it does not fill. */
+/* True if the attribute's lines fill the field of this row. An attribute that is only checked, refused or ignored names
+ * a field but does not fill it. */
 constexpr bool fills(const table_attrs &attribute, const cdb::field_fact &row) {
     std::string_view name(attribute.ta_name, attribute.ta_length);
     std::string_view rest = row.lines;
@@ -53,7 +53,7 @@ constexpr bool fills(const table_attrs &attribute, const cdb::field_fact &row) {
     return false;
 }
 
-/* Whether an attribute stores nothing in the field that it names: it is checked only, or refused, or ignored. */
+/* True if the attribute stores nothing in the field that it names, because it is only checked, refused or ignored. */
 constexpr bool stores_nothing(const table_attrs &attribute) {
     return attribute.ta_type == AT_SD_INDEX || attribute.ta_type == AT_SD_DEFAULT_VALUE ||
            attribute.ta_type == AT_LIST_ACTION_CLASS || attribute.ta_type == AT_LIST_ACTION_RSRC;

@@ -1,10 +1,10 @@
-/* limits.h: how much a source may have of what. */
+/* limits.h: limits for sources. */
 #ifndef CDGEN_LANGUAGE_LIMITS_H
 #define CDGEN_LANGUAGE_LIMITS_H
 
 #include <cstddef>
 
-/* Bytes of a line that are read as one, the newline included; a longer line is read in pieces. */
+/* The most bytes of a line that are read at once, including the newline; a longer line is read in pieces. */
 constexpr std::size_t LINE_MAX_CHARS = 254;
 
 /* Bytes of an attribute's value, without quotes. */

@@ -29,7 +29,7 @@ constexpr message table[] = {
     {MSG_UNMATCHED_QUOTES, "S104", "Unmatched double quotes for attribute: ", FIRST, mark_kind::value, blame::source,
      "A value starts with a double quote but does not end with one, or ends with `\\\"`.",
      "Close the quote at the end of the value; only a comment may follow it."},
-    /* Deliberately spelled so, as MSG_INDEX_NOT_CONSECUTIVE is. */
+    /* The misspelling is deliberate, as in MSG_INDEX_NOT_CONSECUTIVE. */
     {MSG_VALUE_TOO_LONG, "S105", "Attibute value exceeds maximum length: ", FIRST, mark_kind::value, blame::source,
      "A value has more than 1797 characters. A source line cannot hold that many, so no source "
      "causes this.",
@@ -203,7 +203,7 @@ constexpr message table[] = {
 };
 static_assert(std::size(table) == MESSAGE_COUNT, "each message has a row");
 
-/* Every row is whole and at the position that its id says. */
+/* True if every row is complete and is at the position of its id. */
 consteval bool rows_are_sound() {
     for (std::size_t i = 0; i < std::size(table); ++i) {
         const message &row = table[i];
@@ -219,7 +219,7 @@ consteval bool rows_are_sound() {
 }
 static_assert(rows_are_sound(), "in the order of the ids and of the codes, with code, text, cause and cure");
 
-/* Whether a text states the number. */
+/* True if a text contains the number. */
 consteval bool states(std::string_view text, std::size_t number) {
     char digits[20] = {};
     std::size_t first = std::size(digits);

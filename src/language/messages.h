@@ -1,4 +1,4 @@
-/* messages.h: the errors of a compilation, each known by its id. One table holds what is said about them. */
+/* messages.h: the errors of a compilation, each with an id. One table holds their texts and explanations. */
 #ifndef CDGEN_LANGUAGE_MESSAGES_H
 #define CDGEN_LANGUAGE_MESSAGES_H
 
@@ -90,7 +90,7 @@ enum message_id : std::uint8_t {
     MSG_IMAGE_TOO_SMALL,
 
     MESSAGE_COUNT,
-    NO_MESSAGE = MESSAGE_COUNT /* whoever found the error has already reported it */
+    NO_MESSAGE = MESSAGE_COUNT /* the error has already been reported where it was found */
 };
 
 /* The part of a line that an error is marked at. */

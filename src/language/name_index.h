@@ -15,15 +15,15 @@ public:
 
     constexpr name_index() = default;
 
-    /* name_of(i), for i below count, are the names; at most MOST_NAMES, no two alike in length and in the first, the
-     * middle and the last character. (If two are, the search for a multiplier does not end, and the
-     * compiler says so.) */
+    /* name_of(i), for i below count, are the names. There are at most MOST_NAMES, and no two may have the same length
+     * and the same first, middle and last character. (Otherwise the search for a multiplier does not end, and the C++
+     * compiler reports that.) */
     template <class NameOf> consteval name_index(std::size_t count, NameOf name_of) {
         while (!fill(count, name_of))
             multiplier *= 0x5851F42D4C957F2D; /* stays odd */
     }
 
-    /* The position of the only name that may be this one, which is for the caller to compare; or NOT_FOUND. */
+    /* The position of the only name that this can be, or NOT_FOUND. The caller has to compare the two. */
     constexpr int candidate(std::string_view name) const {
         return name.empty() ? NOT_FOUND : slots[slot_of(name)];
     }

@@ -1,4 +1,4 @@
-/* names.cpp: the names that the catalogue has. */
+/* names.cpp: the names in the catalogue. */
 
 #include "language/names.h"
 
@@ -20,7 +20,7 @@ template <class Properties> name_list names_of(const Properties &properties) {
     return names;
 }
 
-/* An attribute, and one that does the same in other kinds. */
+/* An attribute, and the attribute with the same purpose in other kinds. */
 constexpr std::pair<std::string_view, std::string_view> sisters[] = {
     {"Name", "ElementName"},
     {"Name", "VariableClass"},
@@ -37,7 +37,7 @@ constexpr std::pair<std::string_view, std::string_view> sisters[] = {
     {"ResourcePermTemplate", "Permission"},
 };
 
-/* The attributes of a kind that do what one of another kind does. */
+/* The attributes of a kind that have the same purpose as an attribute of another kind. */
 name_list sisters_of(std::string_view attribute, const srtable_ctrl &kind) {
     name_list found;
     for (const auto &[other, here] : sisters)
@@ -46,7 +46,7 @@ name_list sisters_of(std::string_view attribute, const srtable_ctrl &kind) {
     return found;
 }
 
-/* Of all kinds, each name once. */
+/* The attribute names of all kinds, each once. */
 name_list all_attribute_names() {
     name_list names;
     for (const srtable_ctrl &kind : std::span(sc_tables).first(SC_COUNT))

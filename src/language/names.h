@@ -1,4 +1,4 @@
-/* names.h: the names that the catalogue has, for messages and suggestions. */
+/* names.h: the names in the catalogue, for messages and suggestions. */
 #ifndef CDGEN_LANGUAGE_NAMES_H
 #define CDGEN_LANGUAGE_NAMES_H
 
@@ -19,9 +19,9 @@ name_list attribute_names(const srtable_ctrl &kind);
 /* The stanza kinds that have an attribute of exactly this name. */
 kind_set kinds_with(std::string_view attribute);
 
-/* The attribute of a kind that a text was meant to be. Besides names that are like the text, it may be the attribute
- * that does in this kind what the text's attribute does in others: `InitialValue` is the `DefaultValue` of a persistent
- * attribute. */
+/* The attribute of a kind that was probably meant by a text. This is an attribute with a similar name, or one that has
+ * the same purpose in this kind as the named attribute in other kinds: for `InitialValue` in a persistent attribute it
+ * is `DefaultValue`. */
 guess attribute_meant_by(std::string_view text, const srtable_ctrl &kind);
 
 /* The properties that an attribute type, such as AT_PATTR_PROPS, takes. */

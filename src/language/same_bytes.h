@@ -9,7 +9,7 @@
 
 namespace language {
 
-/* Whether both begin with the same word, and end with one, after n bytes. The two words may overlap. */
+/* True if both begin with the same word and, n bytes long, end with the same word. The two words may overlap. */
 template <class Word> bool same_ends(const char *a, const char *b, std::size_t n) {
     auto differ = [a, b](std::size_t at) {
         Word left = 0;
@@ -21,7 +21,7 @@ template <class Word> bool same_ends(const char *a, const char *b, std::size_t n
     return (differ(0) | differ(n - sizeof(Word))) == 0;
 }
 
-/* Whether memcmp would find n bytes the same. */
+/* True if memcmp would find n bytes equal. */
 [[gnu::always_inline]] inline bool same_bytes(const char *a, const char *b, std::size_t n) {
     for (constexpr std::size_t STEP = sizeof(std::uint64_t); n > 2 * STEP; a += STEP, b += STEP, n -= STEP)
         if (!same_ends<std::uint64_t>(a, b, STEP))

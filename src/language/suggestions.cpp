@@ -1,4 +1,4 @@
-/* suggestions.cpp: which known name a misspelt one may stand for. */
+/* suggestions.cpp: finds the known name that a misspelt one was meant to be. */
 
 #include "language/suggestions.h"
 
@@ -20,11 +20,11 @@ char lower(char c) {
 }
 
 constexpr size_t LONGEST_NAME = 64; /* characters; a longer text is not compared */
-constexpr size_t FARTHEST = 4;      /* edits from which on a text is not like a name */
-constexpr size_t LISTED_MAX = 40;   /* names; nobody reads more */
-constexpr size_t MEANT_MAX = 3;     /* names that one text may stand for */
+constexpr size_t FARTHEST = 4;      /* a text with this many edits or more is not similar to a name */
+constexpr size_t LISTED_MAX = 40;   /* names in a list; more would not be read */
+constexpr size_t MEANT_MAX = 3;     /* at most this many names are suggested for a text */
 
-/* Data types of other languages, in small letters, and what they are here. */
+/* Data types of other languages, in lower case, and their names here. */
 struct foreign_type {
     std::string_view name;
     std::array<std::string_view, 2> here;
@@ -39,8 +39,9 @@ constexpr foreign_type foreign_types[] = {
     {"uint", {"UInt32"}},          {"unsigned", {"UInt32"}},
 };
 
-/* The edits between two texts: letters added, dropped, replaced or swapped with a neighbour; case does not count. At
- * most the limit. Only the diagonal band below the limit is computed, since a source may have very many names. */
+/* The edits between two texts: letters added, dropped, replaced or swapped with a neighbour; case does not count.
+ * Returns at most the limit. Only the diagonal band below the limit is computed, because a source may have very many
+ * names. */
 size_t distance(std::string_view a, std::string_view b, size_t limit) {
     using row = std::array<size_t, LONGEST_NAME + FARTHEST + 1>;
     if (std::max(a.size(), b.size()) - std::min(a.size(), b.size()) >= limit)
@@ -71,7 +72,7 @@ size_t distance(std::string_view a, std::string_view b, size_t limit) {
 }
 
 name_list named_types() {
-    return {std::begin(vxTypeStr) + 1, std::end(vxTypeStr)}; /* the first stands for none */
+    return {std::begin(vxTypeStr) + 1, std::end(vxTypeStr)}; /* the first type means "none" */
 }
 
 /* Types that have a name but are not accepted, anywhere or in an element. */
@@ -79,7 +80,7 @@ bool is_refused(std::string_view type, bool element) {
     return type == "SBS" || (element && (type == "SD" || type == "SDArray"));
 }
 
-/* The near miss, or an empty guess. */
+/* The most similar name, or an empty guess. */
 guess near_guess(std::string_view text, const name_list &names) {
     if (text.size() > LONGEST_NAME)
         return {};

@@ -1,4 +1,4 @@
-/* suggestions.h: which known name a misspelt one may stand for. Pure functions of texts. */
+/* suggestions.h: finds the known name that a misspelt one was meant to be. Pure functions of texts. */
 #ifndef CDGEN_LANGUAGE_SUGGESTIONS_H
 #define CDGEN_LANGUAGE_SUGGESTIONS_H
 
@@ -9,51 +9,52 @@
 
 namespace language {
 
-/* How a text is like the name that it was meant to be. */
+/* How a text resembles the name that it was meant to be. */
 enum class likeness { one_edit, few_edits, word };
 
-/* What a text was meant to be. */
+/* The name that a text was meant to be. */
 struct guess {
-    /* The one name; empty if there is none, or several. */
+    /* the suggested name; empty if there is no suggestion or more than one */
     std::string_view name() const {
         return names.size() == 1 ? names.front() : std::string_view();
     }
-    /* No other name is in sight. */
+    /* True if no other name is similar. */
     bool is_certain() const {
         return names.size() == 1 && how == likeness::one_edit;
     }
 
-    name_list names = {}; /* at most three, one of which was meant */
+    name_list names = {}; /* up to three names, one of which was probably meant */
     likeness how = likeness::word;
 };
 
-/* The one name that the text is most like: the one that takes the fewest letters added, dropped, replaced or swapped
- * with a neighbour. Case does not count. Empty if no name is near enough, or if two are equally near. */
+/* The name that is most similar to the text: the one with the smallest number of letters added, dropped, replaced or
+ * swapped with a neighbour. Case does not count. Empty if no name is similar enough, or if two are equally similar. */
 std::string_view near_miss(std::string_view text, const name_list &names);
 
-/* All names that take one edit, as above, or none but the case of letters. */
+/* All names that differ from the text by one such edit, or only by case. */
 name_list one_edit_from(std::string_view text, const name_list &names);
 
-/* The near miss of a text; without one, the names that it is a part of. */
+/* The most similar name; if there is none, the names that the text is a part of. */
 guess meant_by(std::string_view text, const name_list &names);
 
-/* Begins a list of names. It is longer than other notes, and the same for all misspelt names of one kind. */
+/* Begins a note with a list of names. Such a note is longer than others, and the same for all misspelt names of one
+ * kind. */
 inline constexpr std::string_view KNOWN_NAMES = "known are ";
 
 /* "did you mean `Name`?" if there is a guess; else "known are `Name` and `Id`", which is empty if there are no names,
  * or too many to read. */
 std::string suggestion(const guess &meant, const name_list &names);
 
-/* The same for what a text is meant by. */
+/* The same for a guess that has already been made. */
 std::string suggestion(std::string_view text, const name_list &names);
 
 /* The data types that the compiler accepts for an attribute, or for an element. */
 name_list data_type_names(bool element);
 
-/* The data type that a text was meant to be, if the compiler accepts it. It may be one of another language. */
+/* The data type that a text was meant to be, if the compiler accepts it. The text may be a type of another language. */
 guess type_meant_by(std::string_view text, bool element);
 
-/* As suggestion(), for a data type; for a text near a type that is not accepted it says so. */
+/* Like suggestion(), for a data type. If the text is similar to a type that is not accepted, the note says so. */
 std::string type_suggestion(std::string_view text, bool element);
 
 name_list variable_type_names();

@@ -12,8 +12,8 @@ using name_list = std::vector<std::string_view>;
 /* The words of a name: "PAttrSDDefinition" has "P", "Attr", "SD" and "Definition". */
 name_list words_of(std::string_view name);
 
-/* Whether a text is a name with words left out or cut short, in any case: "desc" is a part of "ReArmDescription", and
- * "PersistentAttribute" of "PersistentResourceAttribute". */
+/* True if a text is a name with words left out or shortened, in upper or lower case: "desc" is a part of
+ * "ReArmDescription", and "PersistentAttribute" of "PersistentResourceAttribute". */
 bool is_part(std::string_view text, std::string_view name);
 
 /* The names that a text of at least three letters is a part of. */

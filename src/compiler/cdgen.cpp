@@ -1,4 +1,5 @@
-/* cdgen.cpp: the driver: command line, the fixed order of the phases, and the one place that prints a fatal message. */
+/* cdgen.cpp: the driver: the command line, the fixed order of the phases, and the only place that prints a fatal
+ * message. */
 
 #include "compiler/cdgen.h"
 
@@ -13,7 +14,7 @@
 namespace {
 
 void parse_options(cdgen &cx, int argc, char **argv) {
-    optind = 0; /* forget an earlier command line of this process altogether */
+    optind = 0; /* forget any earlier command line of this process */
     for (int option = 0; (option = getopt(argc, argv, "nd:s")) != -1;) {
         switch (option) {
         case 'n':
@@ -21,12 +22,13 @@ void parse_options(cdgen &cx, int argc, char **argv) {
             break;
         case 'd':
             cx.options.debugLevel =
-                atoi(optarg); /* 0 for text that is not a number; not a conversion of the source's */
+                atoi(optarg); /* 0 for text that is not a number; does not affect the errno of conversions in the source
+                               * */
             break;
         case 's':
             cx.options.swap_endianness = 1;
             break;
-        default: /* getopt has complained: nothing else is to be printed */
+        default: /* getopt has printed a message, so nothing else is printed */
             throw fatal_exit{NO_MESSAGE, nullptr, nullptr, 0, 1};
         }
     }

@@ -1,4 +1,4 @@
-/* cdgen.h: the compiler. One way for the data: source line -> attribute -> staging record -> staging table -> image. */
+/* cdgen.h: the compiler. Data goes one way: source line -> attribute -> staging record -> staging table -> image. */
 #ifndef CDGEN_CDGEN_H
 #define CDGEN_CDGEN_H
 

@@ -1,4 +1,4 @@
-/* cdgen_attr.cpp: one attribute line: its syntax, the order and repetition rules. */
+/* cdgen_attr.cpp: takes one attribute line: its syntax, and the rules of order and repetition. */
 
 #include "compiler/cdgen_attr.h"
 
@@ -9,7 +9,7 @@
 
 namespace {
 
-/* The name and value of a line, each ended by a NUL; no value when there is nothing to store. */
+/* Splits a line into name and value, each ended by a NUL; no value if there is nothing to store. */
 struct name_value {
     std::string_view name;
     char *value;

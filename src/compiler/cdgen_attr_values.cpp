@@ -134,7 +134,7 @@ struct bounds {
     std::string_view high;
 };
 
-/* Splits the value at its first comma, in place; nothing without a comma. */
+/* Splits the value at its first comma, in place. Returns no value if there is no comma. */
 std::optional<bounds> split_bounds(const attr_line &line) {
     char *high = getNextArrVal(line.value);
     if (high == nullptr)
@@ -143,8 +143,8 @@ std::optional<bounds> split_bounds(const attr_line &line) {
     return bounds{{line.value, low_length}, {high, line.length - low_length - 1}};
 }
 
-/* The offset of a list's next entry: the first one has its room in the list's header, each other one goes to the end of
- * the table, which is where the list ends. */
+/* The offset of a list's next entry. The list's header has room for the first entry; each other entry is added at the
+ * end of the table, which is also the end of the list. */
 template <class List>
 size_t next_entry(cdgen &cx, tbl *t, size_t list, vx_uint32_t List::*count, size_t first, size_t size) {
     if (record_at<List>(t, list)->*count == 0)
@@ -170,7 +170,7 @@ void store_variety(const attr_line &line) {
     ++record_at<variety_list_t>(varieties, list)->vl_count;
 }
 
-/* Converts a text to a value that waits in the line's pool. */
+/* Converts a text to a value, which is kept in the pool of the line. */
 vx_value_t converted(const attr_line &line, vx_data_type_t type, std::string_view text) {
     vx_value_t value = {};
     if (str_to_vx(line.cx, &value, type, text, line.cx.line_texts) != 0)
@@ -190,7 +190,7 @@ void copied(const attr_line &line, vx_value_t *cell, const vx_value_t &value, vx
 constexpr message_id COPY_ERROR = MSG_COPY_FAILED;
 constexpr message_id DATA_ERROR = MSG_INVALID_VALUE;
 
-/* With a comma, high then low; without one, one value that is written twice, low then high. */
+/* With a comma, stores high, then low; without one, stores the value twice, as low, then as high. */
 void store_bounds(const attr_line &line, vx_data_type_t type, vv_entry_t *entry) {
     if (std::optional<bounds> given = split_bounds(line)) {
         copied(line, &entry->vv_high_val, converted(line, type, given->high), type, COPY_ERROR);
@@ -202,7 +202,7 @@ void store_bounds(const attr_line &line, vx_data_type_t type, vv_entry_t *entry)
     }
 }
 
-/* Adds to the list at the field's offset; entries of a list are of the owner's scalar type. */
+/* Adds an entry to the list at the field's offset. The entries have the owner's type, or its element type. */
 void add_valid_value(const attr_line &line) {
     cdgen &cx = line.cx;
     tbl *lists = sc_vv_tbl(cx, line.scp);
@@ -247,7 +247,7 @@ std::shared_ptr<dflt_values> new_dflt_values(cdgen &cx, const char *name, vx_dat
     return std::move(cx.framing.spare_dflt);
 }
 
-/* Collects the value; the attribute's completion makes one of all that were given. */
+/* Collects the value. When the attribute is completed, all collected values become its default. */
 void store_default(const attr_line &line) {
     cdgen &cx = line.cx;
     vx_data_type_t type = data_type(line);
@@ -289,8 +289,8 @@ bool takes_range(vx_data_type_t type) {
     return scalar < VX_CHAR_PTR || scalar > VX_SD_PTR;
 }
 
-/* Deliberate: an open resource attribute gets the range even when the line is in a class attribute's stanza, whose
- * type it is converted as. */
+/* Deliberate: an open resource attribute gets the range even if the line is in the stanza of a class attribute, and the
+ * range is converted as that attribute's type. */
 void store_range(const attr_line &line) {
     cdgen &cx = line.cx;
     vx_data_type_t type = data_type(line);
@@ -327,7 +327,7 @@ void store_sd_display(const attr_line &line) {
     line.cx.sd.element.sd_disp_found = 1;
 }
 
-/* Text that is not a number keeps the latest index, which then is not the expected one. */
+/* Text that is not a number leaves the previous index, which is then not the expected one. */
 void check_sd_index(const attr_line &line) {
     cdgen &cx = line.cx;
     vx_value_t index = {};
@@ -342,7 +342,7 @@ void check_sd_index(const attr_line &line) {
     cx.sd.expect_index(static_cast<int>(static_cast<unsigned>(cx.sd.index()) + 1));
 }
 
-/* An unknown type is deliberately no error here. */
+/* Deliberate: an unknown type is not an error here. */
 void store_sd_data_type(const attr_line &line) {
     cdgen &cx = line.cx;
     vx_data_type_t type = data_type_named(value_of(line));

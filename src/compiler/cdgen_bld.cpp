@@ -1,5 +1,5 @@
-/* cdgen_bld.cpp: sizes the image and writes it into the mapped output file, once, by a cursor that only moves
- * forward. Records go in and out of it by copying, since sections are not aligned. */
+/* cdgen_bld.cpp: sizes the image and writes it into the mapped output file, once, through a cursor that only moves
+ * forward. Records are copied into and out of the image, because sections are not aligned. */
 
 #include "compiler/cdgen_image.h"
 
@@ -83,7 +83,7 @@ void flush_mapfile(cdgen &cx) {
 
 /* ---- Sections -------------------------------------------------------------------------------------------------- */
 
-/* One section in the making: what has been written of it. */
+/* A section that is being written. */
 class section {
 public:
     section(cdgen &context, cdb_dsect_type_t type) : cx(context), anchor{type, offset_in_file(), 0, 0} {}
@@ -96,7 +96,8 @@ public:
         return at;
     }
 
-    /* A staged table's bytes, which the table gives back meanwhile: otherwise all would be there twice at the end. */
+    /* Writes the bytes of a staged table and frees them meanwhile. Otherwise everything would be in memory twice at the
+     * end. */
     size_t move_table(tbl_content *t) {
         size_t size = used_bytes(t);
         if (size == 0)
@@ -109,13 +110,13 @@ public:
         return size;
     }
 
-    /* Zeros up to a multiple of 8, after so many bytes. */
+    /* Writes zeros up to the next multiple of 8 after this many bytes. */
     void round_up(size_t size) {
         constexpr char zeros[8] = {};
         write(zeros, round8(size) - size);
     }
 
-    /* A staged table's bytes, zero-filled to a multiple of 8; returns their rounded size. */
+    /* Writes the bytes of a staged table and zeros up to a multiple of 8; returns the rounded size. */
     vx_uint32_t write_rounded(const tbl_content *t) {
         size_t size = used_bytes(t);
         write(size > 0 ? t->tbl_base : nullptr, size);
@@ -133,7 +134,7 @@ private:
         return static_cast<vx_uint32_t>(cx.image.dsp - cx.image.chp);
     }
 
-    /* The image has been sized before; only tables that no stanza fills are not counted. */
+    /* The image has the computed size. Only tables that no stanza fills were not counted. */
     void reserve(size_t size) {
         if (size > static_cast<size_t>(cx.image.chp + cx.output.gross_file_size - cx.image.dsp))
             bld_error_exit(MSG_IMAGE_TOO_SMALL, nullptr, nullptr, 1);
@@ -145,8 +146,8 @@ private:
     cdb_dsect_anchor_t anchor;
 };
 
-/* Notes where in the image the class's stray references are, once its tables have their places. Classes are the first
- * sections. */
+/* Notes the places of the class's stray references in the image, when its tables have their places. Classes are the
+ * first sections. */
 void note_nowhere(cdgen &cx, const rsrc_class_t &record, const char *at) {
     for (; cx.stray.strays_done < cx.stray.strays.size(); ++cx.stray.strays_done) {
         const stray_reference &stray = cx.stray.strays[cx.stray.strays_done];
@@ -173,7 +174,8 @@ void add_class(cdgen &cx, const rsrc_class_t &staged) {
     out.finish();
 }
 
-/* The name is the first string of the table that follows, so that its reference is 0, as is the table's own. */
+/* The name is the first string of the table that follows, so the reference to it is 0, and so is the reference to the
+ * table. */
 void add_mgr(cdgen &cx, const rsrc_mgr_t &staged) {
     section out(cx, CDB_DSECT_RSRC_MGR);
     rsrc_mgr_t record = staged;
@@ -212,7 +214,7 @@ template <class Record, class Add> void add_all(cdgen &cx, tbl *t, message_id mi
         add(cx, record);
 }
 
-/* The largest number among the records of a staged table, 0 if there is none. */
+/* The largest number among the records of a staged table; 0 if the table is empty. */
 template <class Record> vx_uint16_t max_id(tbl *t, vx_uint16_t Record::*id) {
     vx_uint16_t max = 0;
     for (const Record &record : records_of<Record>(t))
@@ -268,7 +270,7 @@ void drop_latest_class(cdgen &cx) {
         return;
     try {
         cx.sections.dropped_class_sizes += class_size(all.back());
-    } catch (const fatal_exit &) { /* a table is too large, which is an error at the end of the source */
+    } catch (const fatal_exit &) { /* a table is too large, which is reported at the end of the source */
         return;
     }
     for (size_t table = cdb::side_tables_as_made.size(); table-- > 0;)

@@ -13,7 +13,7 @@ namespace {
 
 constexpr size_t VARIABLE_IDS_AU = 64;
 
-/* Variable classes by name; of several with one name, the first. */
+/* Finds variable classes by name; if several have the same name, the first. */
 class class_index {
 public:
     explicit class_index(std::span<rsrc_variable_class_t> all)
@@ -29,7 +29,7 @@ public:
     }
 
 private:
-    /* One without a name is one without strings. */
+    /* A variable class without a name has no strings. */
     static bool is_named(const rsrc_variable_class_t &variable_class) {
         const tbl_content *strings = staged_content(variable_class.u_rvc_string_tbl);
         return strings != nullptr && strings->tbl_base != nullptr;

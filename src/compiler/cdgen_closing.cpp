@@ -18,7 +18,7 @@ void complete_sd_run(cdgen &cx) {
         cmplt_sd_tbl(cx, cx.framing.curr_sd_scp);
 }
 
-/* The collected defaults, which have all been serialised; the image needs the memory. */
+/* Frees the collected defaults, which have all been serialised, because the image needs the memory. */
 void drop_values(cdgen &cx) {
     for (stanza_state &state : cx.framing.stanzas)
         state.dflt = {};

@@ -8,7 +8,7 @@
 
 using closing_step = void (*)(cdgen &);
 
-/* Up to the sizing of the image, in this order. */
+/* The steps up to the sizing of the image, in this order. */
 extern const std::span<const closing_step> closing_steps;
 
 #endif

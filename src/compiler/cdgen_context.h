@@ -14,7 +14,7 @@
 
 #include <cstdio>
 
-/* What the driver wants. */
+/* The options of a compilation. */
 struct compile_options {
     int interactive = 1; /* messages end with a newline */
     int debugLevel = 0;
@@ -22,7 +22,7 @@ struct compile_options {
     const char *cdefsrc = nullptr;
     const char *cdefname = nullptr;
     line_observer *observer = nullptr;
-    FILE *explanations = stdout; /* where the traces go that explain an error; null: nowhere */
+    FILE *explanations = stdout; /* where traces that explain an error are written; null: nowhere */
 };
 
 struct cdgen {
@@ -50,7 +50,7 @@ struct cdgen {
     output_file output;
 };
 
-/* Reaching the end exactly grows the table too. Without a block there is no room. */
+/* The table also grows if its end is reached exactly. A table without a block has no room. */
 inline void *alloc_tble(cdgen &cx, tbl *t, size_t s) {
     if (s >= t->room() || cx.options.debugLevel > 2)
         make_room(cx, *t, s);

@@ -12,7 +12,7 @@ constexpr size_t DIGITS_AT_ONCE = 8;
 constexpr size_t MOST_DIGITS = 2 * DIGITS_AT_ONCE; /* that all_digits takes */
 
 /* The four to eight digits of a text in the bytes of a word, the last digit in the highest byte and zeros in front. A
- * byte of another character is more than 9. Needs a machine whose words begin with the lowest byte. */
+ * byte of another character is more than 9. Works on little-endian machines only. */
 inline uint64_t digits_in_word(const char *text, size_t count) {
     uint32_t first = 0;
     uint32_t last = 0;
@@ -23,12 +23,12 @@ inline uint64_t digits_in_word(const char *text, size_t count) {
     return characters ^ (uint64_t{0x3030303030303030} << in_front);
 }
 
-/* Whether no byte is more than 9. */
+/* True if no byte is more than 9. */
 inline bool are_digits(uint64_t bytes) {
     return (((bytes + 0x7676767676767676) | bytes) & 0x8080808080808080) == 0;
 }
 
-/* Their number: pairs of digits first, then all pairs with two multiplications. */
+/* The number that the digits mean. Digits are first combined to pairs, then all pairs with two multiplications. */
 inline uint64_t number_of(uint64_t digits) {
     uint64_t pairs = digits * 10 + (digits >> 8);
     constexpr uint64_t ONE_IN_FOUR = 0x000000FF000000FF;
@@ -37,7 +37,7 @@ inline uint64_t number_of(uint64_t digits) {
     return (odd + even) >> 32;
 }
 
-/* Whether a text is nothing but up to eight digits; then *value is its number. */
+/* True if a text consists of up to eight digits; *value is then its number. */
 inline bool few_digits(const char *text, size_t count, uint64_t *value) {
     if (std::endian::native == std::endian::little && count >= sizeof(uint32_t)) {
         uint64_t digits = digits_in_word(text, count);
@@ -55,7 +55,7 @@ inline bool few_digits(const char *text, size_t count, uint64_t *value) {
     return count > 0;
 }
 
-/* The same of up to MOST_DIGITS digits; false for more. */
+/* The same for up to MOST_DIGITS digits; false for more. */
 inline bool all_digits(std::string_view text, uint64_t *value) {
     if (text.size() <= DIGITS_AT_ONCE)
         return few_digits(text.data(), text.size(), value);

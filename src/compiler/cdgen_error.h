@@ -8,8 +8,8 @@
 
 struct cdgen;
 
-/* The one exception, thrown by the fatal exits and caught by the driver. The details are literals, or belong to the
- * context or to the caller of the compilation; each may be null. */
+/* The only exception, thrown by the fatal exits and caught by the driver. The details are literals, or are owned by the
+ * context or by the caller of the compilation; each may be null. */
 struct fatal_exit {
     message_id id; /* NO_MESSAGE: nothing is to be printed */
     const char *detail1;
@@ -22,19 +22,19 @@ struct fatal_exit {
     int record = -1;
 };
 
-/* The message and its details in the order in which they are printed, without separators; none is null. There must be a
- * message. */
+/* The texts of the message and its details in the order in which they are printed, without separators; no text is null.
+ * There must be a message. */
 std::array<const char *, 3> words_of(const fatal_exit &failure);
 
-/* End the compilation: no return. Parsing and assembly use cdgen_error_exit, the image builder bld_error_exit. Details
- * may be null. */
+/* These functions end the compilation and do not return. Parsing and assembly use cdgen_error_exit, the image builder
+ * bld_error_exit. Details may be null. */
 [[noreturn]] void cdgen_error_exit(message_id id, const char *detail1, const char *detail2, int line, int code);
 [[noreturn]] void bld_error_exit(message_id id, const char *detail1, const char *detail2, int code);
 
 /* The usual case: a message about the current line, status 1. */
 [[noreturn]] void source_error(cdgen &cx, message_id id, const char *detail1 = nullptr, const char *detail2 = nullptr);
 
-/* Runs the completion of a kind's record; a failure will say so. */
+/* Runs the completion of a kind's record. If it fails, the exception names the kind. */
 template <class Complete> void completing(int kind, Complete complete) {
     try {
         complete();

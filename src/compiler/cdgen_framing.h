@@ -8,8 +8,8 @@
 #include <array>
 #include <memory>
 
-/* Values that wait for their attribute to be completed: one 8-byte cell each, for an SD-typed attribute the types of
- * its elements. */
+/* Values that are kept until their attribute is completed, in one 8-byte cell each. For an SD-typed attribute these are
+ * the types of its elements. */
 struct dflt_values {
     dflt_values(const char *name, vx_data_type_t type = VX_UNKNOWN) : cells(32, name), sd_type(type) {}
 
@@ -24,7 +24,7 @@ struct dflt_values {
     }
 
     struct tbl cells;
-    text_pool texts;        /* what the cells point at */
+    text_pool texts;        /* the memory that the cells point to */
     vx_data_type_t sd_type; /* of an SD-typed attribute: its type, VX_SD_PTR or VX_SD_PTR_ARRAY; or unknown */
 };
 
@@ -34,9 +34,9 @@ struct dflt_tbl {
     size_t num_elems = 0;
 };
 
-/* What is known of a kind's current stanza. */
+/* The state of a kind's current stanza. */
 struct stanza_state {
-    /* A stanza of the kind has given nothing yet. */
+    /* Clears the state for a new stanza of the kind. */
     void restart() {
         req_mask = opt_mask = 0;
         order.restart();

@@ -16,18 +16,18 @@ struct stray_reference {
     int rsrc_class; /* the class's position among all */
     cdb_ref_t rsrc_class_t::*records;
     size_t offset;           /* in that table of the class, bytes */
-    bool to_numbers = false; /* it leads to such an array */
+    bool to_numbers = false; /* true: it leads to such an array */
 };
 
-/* What the reversal cannot see in the image. */
+/* Facts that the reversal needs but cannot see in the image. */
 struct stray_references {
     std::vector<stray_reference> strays; /* by class */
     size_t strays_done = 0;              /* those whose class has been written */
-    std::vector<size_t> nowhere;         /* places in the image, in bytes, of those that are no references */
+    std::vector<size_t> nowhere;         /* places in the image, in bytes, of those that are not references */
     std::vector<size_t> to_numbers;      /* and of those that lead to numbers; ascending */
 };
 
-/* The image is reached by copying: sections are not aligned. */
+/* The image is read and written by copying, because sections are not aligned. */
 struct image_cursor {
     char *chp = nullptr;         /* the image: its header */
     char *dsect_anchs = nullptr; /* the anchors */
@@ -36,8 +36,8 @@ struct image_cursor {
     char *dsp = nullptr; /* where the next bytes go */
 };
 
-/* The image. cdb_size also stores counts and sizes into the staged class records; fit_image counts the sections first,
- * and so finds all that can be wrong with an image before there is a file. */
+/* The image. cdb_size also stores counts and sizes in the staged class records. fit_image counts the sections first, so
+ * it finds everything that can be wrong with an image before a file exists. */
 void bld_cdb(cdgen &cx);
 /* The same without a file, and always in the machine's own byte order. Both give back the tables of classes that they
  * have written. */

@@ -7,7 +7,7 @@
 #include "format/constants.h"
 #include "language/catalogue_rows.h"
 
-/* "None" while staged. */
+/* Makes a reference "none" in a staged record. */
 inline void mark_absent(cdb_ref_t &ref) {
     ref = {{CDB_NONE, 0}};
 }
@@ -45,8 +45,8 @@ template <class Attribute> void settle_group(Attribute &attr, const stanza_state
         attr.ra_group_msgid = 0;
 }
 
-/* A dynamic resource attribute, about to be filed, may have the range of a class attribute of another type: a number
- * where it would refer to a value. */
+/* Called before a dynamic resource attribute is filed. It may have the range of a class attribute of another type, and
+ * so a number where it would refer to a value. */
 void note_stray_range(cdgen &cx, const rsrc_dattr_t &attr, cdb_ref_t rsrc_class_t::*records);
 
 inline bool has_values(const dflt_tbl &dflt) {

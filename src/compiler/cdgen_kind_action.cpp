@@ -5,7 +5,7 @@
 
 namespace {
 
-/* What sets the two kinds apart. */
+/* The differences between the two kinds. */
 struct action_kind {
     stanza_id id;
     rsrc_action_t staging_records::*record;

@@ -6,11 +6,11 @@
 
 namespace {
 
-/* What sets the two kinds apart. */
+/* The differences between the two kinds. */
 struct dattr_kind {
     stanza_id id;
     rsrc_dattr_t staging_records::*record;
-    vx_uint16_t valid_value_lists::*vv_found; /* the stanza already has its list of valid values */
+    vx_uint16_t valid_value_lists::*vv_found; /* true: the stanza already has its list of valid values */
     cdb_ref_t rsrc_class_t::*records;
     vx_uint32_t cb_id;
     bool shows_masks; /* deliberate: only the class kind prints its masks before it is found incomplete */
@@ -31,7 +31,7 @@ constexpr dattr_kind class_kind = {.id = SC_DYNAMIC_CLASS_ATTRIBUTE,
 
 constexpr message_id NO_CLASS = MSG_NO_CLASS_FOR_DATTR;
 
-/* Whether or not a range was given. */
+/* True for types that have no range, even if one was given. */
 bool has_no_range(vx_data_type_t type) {
     return type == VX_SD_PTR || type == VX_CHAR_PTR || type == VX_BINARY_PTR || type == VX_RSRC_HANDLE_PTR;
 }

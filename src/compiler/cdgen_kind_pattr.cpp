@@ -5,11 +5,11 @@
 
 namespace {
 
-/* What sets the two kinds apart. */
+/* The differences between the two kinds. */
 struct pattr_kind {
     stanza_id id;
     rsrc_pattr_t staging_records::*record;
-    vx_uint16_t valid_value_lists::*vv_found; /* the stanza already has its list of valid values */
+    vx_uint16_t valid_value_lists::*vv_found; /* true: the stanza already has its list of valid values */
     cdb_ref_t rsrc_class_t::*records;
     vx_uint32_t cb_id;
     message_id no_class;

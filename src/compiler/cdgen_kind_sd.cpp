@@ -13,8 +13,8 @@ template <class List> vx_uint32_t make_list(cdgen &cx, tbl *t, vx_uint32_t List:
     return static_cast<vx_uint32_t>(reinterpret_cast<char *>(list) - t->tbl_base);
 }
 
-/* Room for one element more of the section at an offset: the first one's is in the header. Nothing else goes into the
- * table while a run is open, so its elements are adjacent. */
+/* Makes room for one more element of the section at an offset. The header has room for the first one. Nothing else goes
+ * into the table while a run is open, so its elements are adjacent. */
 size_t next_sd_field(cdgen &cx, tbl *sd_defs, size_t section) {
     if (record_at<sd_def_t>(sd_defs, section)->sd_count == 0)
         return section + offsetof(sd_def_t, sd_fields);
@@ -50,7 +50,7 @@ void dump_sd_default(cdgen &cx, const srtable_ctrl *scp) {
               dflt.tbl->sd_type == VX_SD_PTR ? VX_SD_PTR : VX_SD_PTR_ARRAY);
 }
 
-/* One element's default into the structured value in the making. */
+/* Adds one element's default to the structured value. */
 void dump_sd_element(cdgen &cx, tbl *str_tbl, const dflt_tbl *vtbl, size_t i, vx_value_t *lval, vx_data_type_t dt,
                      sd_anchors *anchors) {
     auto type =

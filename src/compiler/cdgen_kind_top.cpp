@@ -10,7 +10,7 @@ namespace {
 
 constexpr size_t STRINGS_AU = 8192;
 
-/* Absent until a stanza says otherwise. (Those of side tables are taken by their tables at once.) */
+/* Makes references "none" until a stanza sets them. (The references to side tables get their tables at once.) */
 constexpr cdb_ref_t rsrc_class_t::*absent_at_open[] = {
     &rsrc_class_t::u_rc_def_input,     &rsrc_class_t::u_rc_undef_input, &rsrc_class_t::u_rc_online_input,
     &rsrc_class_t::u_rc_offline_input, &rsrc_class_t::u_rc_reset_input, &rsrc_class_t::u_rc_actionsC,
@@ -18,9 +18,10 @@ constexpr cdb_ref_t rsrc_class_t::*absent_at_open[] = {
     &rsrc_class_t::u_rc_sd_defs,       &rsrc_class_t::u_rc_alias,       &rsrc_class_t::u_rc_name,
 };
 
-/* A class without a Name is called what the output file is called in front of ".cdef", directory and all. */
+/* A class without a Name is named after the output file: its path up to ".cdef", including the directory. */
 void default_class_name(cdgen &cx) {
-    const char *suffix = strstr(cx.options.cdefname, ".cdef"); /* deliberately the first, and not only at the end */
+    const char *suffix = strstr(cx.options.cdefname, ".cdef"); /* deliberately the first ".cdef", which need not be at
+                                                                * the end */
     if (suffix == nullptr)
         cdgen_error_exit(MSG_INVALID_OUTPUT_NAME, nullptr, nullptr, 0, 1);
     auto length = static_cast<size_t>(suffix - cx.options.cdefname);

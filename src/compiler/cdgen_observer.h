@@ -1,4 +1,4 @@
-/* cdgen_observer.h: what a caller that looks on may learn and decide while lines are taken. */
+/* cdgen_observer.h: what a caller may observe and decide while lines are taken. */
 #ifndef CDGEN_CDGEN_OBSERVER_H
 #define CDGEN_CDGEN_OBSERVER_H
 
@@ -6,7 +6,7 @@
 
 struct table_attrs;
 
-/* What an attribute line says. The value is taken apart later. */
+/* The name and value of an attribute line. The value is parsed later. */
 struct attr_place {
     const table_attrs *attr = nullptr;
     const char *value = nullptr;
@@ -15,7 +15,7 @@ struct attr_place {
 
 class line_observer {
 public:
-    /* An attribute line has a name that is known and a value that is not too long. */
+    /* Called for an attribute line with a known name and a value that is not too long. */
     virtual void attribute_read(const attr_place &read) = 0;
     /* Whether an optional attribute of the kind's current stanza may come before a required one. kind: a stanza_id */
     virtual bool excuses_missing(int kind) const = 0;

@@ -20,7 +20,7 @@
 namespace {
 
 constexpr size_t PREFILL_BLOCK = 1024;
-constexpr int MOST_TRIES = 16; /* to open a file that other programs remove or replace */
+constexpr int MOST_TRIES = 16; /* attempts to open a file that other programs remove or replace */
 
 [[noreturn]] void cannot(message_id what, const char *reason) {
     bld_error_exit(what, reason, nullptr, 1);
@@ -30,8 +30,8 @@ constexpr int MOST_TRIES = 16; /* to open a file that other programs remove or r
     cannot(what, strerror(error));
 }
 
-/* A descriptor that is closed unless it is handed on. Closing it gives up the lock, so that no signal may remove the
- * file afterwards. */
+/* A descriptor that is closed unless it is passed on. Closing it releases the lock, so after that no signal may remove
+ * the file. */
 struct output_fd {
     explicit output_fd(int opened) : fd(opened) {}
     output_fd(const output_fd &) = delete;
@@ -56,8 +56,8 @@ bool is_stream(const struct stat &file, int stream) {
     return S_ISREG(file.st_mode) && fstat(stream, &st) == 0 && st.st_dev == file.st_dev && st.st_ino == file.st_ino;
 }
 
-/* Asked before it is opened: a source that has been deleted in the meantime may have left its inode number to the new
- * file. */
+/* Called before the output is opened, because the inode number of a source that has been deleted in the meantime may be
+ * used for the new file. */
 void refuse_own_files(cdgen &cx) {
     struct stat st = {};
     if (stat(cx.options.cdefname, &st) != 0)
@@ -68,7 +68,7 @@ void refuse_own_files(cdgen &cx) {
         bld_error_exit(MSG_CANNOT_CREATE, "traces go there", nullptr, 1);
 }
 
-/* Keeps other compilers off the file until it is closed. Where the file system has no locks, nothing does. */
+/* Locks the file against other compilers until it is closed. On a file system without locks it does nothing. */
 void lock_output(int fd) {
     if (flock(fd, LOCK_EX | LOCK_NB) == 0)
         return;
@@ -78,9 +78,9 @@ void lock_output(int fd) {
         cannot(MSG_CANNOT_CREATE, errno);
 }
 
-/* The output, opened but not yet changed; st says what it is. A regular file is locked. If it lost its name before
- * that, because another compiler failed and removed it, it is closed again. Signals are held back so that none leaves
- * behind the empty file that opening may have made. */
+/* Opens the output without changing it; st receives its status. A regular file is locked. If another compiler failed
+ * and removed the file before it was locked, it is closed again. Signals are held back so that none leaves an empty
+ * file that opening may have created. */
 output_fd open_once(cdgen &cx, struct stat &st) {
     refuse_own_files(cx);
     held_signals until_begun;
@@ -128,7 +128,7 @@ size_t prefill(int fd, size_t size) {
                 iovec{const_cast<char *>(zeros.data()), zeros.size()});
     for (size_t written = 0; written < gross;) {
         size_t left = gross - written;
-        blocks[0].iov_len = (left - 1) % PREFILL_BLOCK + 1; /* what a short write has left of its block */
+        blocks[0].iov_len = (left - 1) % PREFILL_BLOCK + 1; /* the rest of a block after a short write */
         size_t count = std::min(blocks.size(), (left - 1) / PREFILL_BLOCK + 1);
         ssize_t n = writev(fd, blocks.data(), static_cast<int>(count));
         if (n < 0 && errno == EINTR)
@@ -174,7 +174,7 @@ void output_file::discard() {
     if (cdb_mapfile_fd <= 0)
         return;
     unmap();
-    begun.remove(); /* while it is locked: afterwards, it may be another compiler's */
+    begun.remove(); /* while it is locked, because afterwards it may belong to another compiler */
     close_mapfile();
 }
 

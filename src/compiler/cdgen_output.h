@@ -9,7 +9,7 @@
 
 struct cdgen;
 
-/* The output file, locked, once it is mapped; removes itself unless it is finished. */
+/* The mapped and locked output file. The destructor removes it unless it is finished. */
 struct output_file {
     output_file() = default;
     output_file(const output_file &) = delete;
@@ -18,8 +18,8 @@ struct output_file {
         discard();
     }
 
-    /* Unmaps the file, cuts it to size bytes and closes it. A file that another program has cut meanwhile is left as it
-     * is, and ends the compilation. */
+    /* Unmaps the file, cuts it to size bytes and closes it. If another program has shortened the file meanwhile, it is
+     * left as it is and the compilation fails. */
     void finish(off_t size);
     /* Unmaps, removes and closes the file if it is mapped. */
     void discard();

@@ -1,4 +1,4 @@
-/* cdgen_process.cpp: how a process that is the compiler alone meets signals and the end of memory. */
+/* cdgen_process.cpp: how the compiler's own process handles signals and the lack of memory. */
 
 #include "compiler/cdgen_process.h"
 
@@ -15,7 +15,7 @@
 
 namespace {
 
-/* Those that end a program and do not say that it is defective. */
+/* The signals that end a program and do not report a defect of it. */
 constexpr int ending_signals[] = {SIGHUP,  SIGINT,    SIGQUIT, SIGTERM, SIGXCPU, SIGALRM,
                                   SIGPROF, SIGVTALRM, SIGUSR1, SIGUSR2, SIGABRT};
 
@@ -28,13 +28,14 @@ void remove_unfinished() {
         output->remove();
 }
 
-/* The handler has already been reset, so raising the signal again ends the program by it, as its sender expects. */
+/* The handler has already been reset, so raising the signal again ends the program with this signal, as its sender
+ * expects. */
 void remove_output(int signal, siginfo_t *, void *) {
     remove_unfinished();
     raise(signal);
 }
 
-/* The file is another's now, and stays. */
+/* The file now belongs to another program and is not removed. */
 [[noreturn]] void report_cut_output() {
     const char *pieces[] = {message_of(MSG_CANNOT_MAP).text, CUT_OUTPUT, "\n"};
     for (const char *piece : pieces)
@@ -42,7 +43,7 @@ void remove_output(int signal, siginfo_t *, void *) {
     _exit(1);
 }
 
-/* Only the system says that there is nothing at an address; other programs may send the signal, too. */
+/* Only the kernel sends it for an address without memory; other programs may send the signal too. */
 void meet_bus_error(int signal, siginfo_t *info, void *context) {
     if (info->si_code == BUS_ADRERR && unfinished != nullptr)
         report_cut_output();
@@ -70,7 +71,8 @@ void handle(int signal, void (*handler)(int, siginfo_t *, void *)) {
 
 void take_process() {
     std::set_terminate(end_without_memory);
-    signal(SIGPIPE, SIG_IGN); /* a stream that nobody reads and a file that may not grow are errors of the call */
+    signal(SIGPIPE, SIG_IGN); /* writing to a closed pipe or beyond a size limit then fails with an error instead of a
+                               * signal */
     signal(SIGXFSZ, SIG_IGN);
     for (int signal : ending_signals)
         handle(signal, remove_output);

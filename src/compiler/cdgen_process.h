@@ -1,4 +1,4 @@
-/* cdgen_process.h: how a process that is the compiler alone ends. */
+/* cdgen_process.h: how the compiler's own process ends. */
 #ifndef CDGEN_CDGEN_PROCESS_H
 #define CDGEN_CDGEN_PROCESS_H
 
@@ -11,15 +11,15 @@ struct unfinished_output {
     dev_t device = 0;
     ino_t inode = 0;
 
-    /* Whether the name still leads to this file: another program may have removed or replaced it. */
+    /* True if the name still refers to this file. Another program may have removed or replaced it. */
     bool has_its_name() const;
-    /* Removes the name if it still leads to this file. */
+    /* Removes the file if the name still refers to it. */
     void remove() const;
 };
 
-/* For a program that is the compiler alone (cdgen_process.cpp): a signal that ends it while it is writing removes
- * the output first; what other programs do to its files and streams, and a lack of memory, end it with a message and a
- * status. */
+/* For a process that runs only the compiler (cdgen_process.cpp). A signal that ends it while it is writing first
+ * removes the output. If other programs interfere with its files and streams, or if memory runs out, it ends with a
+ * message and a status. */
 void take_process();
 /* The output that is being written, which must stay where it is; null if there is none. */
 void set_unfinished_output(const unfinished_output *output);

@@ -11,7 +11,8 @@ bool class_is_open(const cdgen &cx) {
     return cx.staged.cb_rsrc_class.rc_cb_ID != 0;
 }
 
-/* What refers to the SD section of a class or action run. An open class action goes before the resource action. */
+/* The owner of a run of a class or an action, which refers to its SD section. An open class action is preferred to a
+ * resource action. */
 cdb_ref_t *owner_field(cdgen &cx, const sd_owner &owner) {
     if (owner.of_class != nullptr)
         return &(cx.staged.cb_rsrc_class.*owner.of_class);

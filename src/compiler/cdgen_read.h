@@ -1,10 +1,10 @@
-/* cdgen_read.h: what a line does to the stanzas. */
+/* cdgen_read.h: takes lines as headers or attributes of stanzas. */
 #ifndef CDGEN_CDGEN_READ_H
 #define CDGEN_CDGEN_READ_H
 
 #include "compiler/cdgen_attr.h"
 
-/* A header, if it has no blank in front, or an attribute line, which is taken apart. */
+/* Takes a header, if the line does not begin with a blank, or an attribute line, which is modified in place. */
 void take_line(cdgen &cx, const attr_text &text);
 
 #endif

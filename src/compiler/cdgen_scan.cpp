@@ -78,8 +78,8 @@ __m128i is_mark(__m128i piece) {
                         _mm_or_si128(equal(piece, '/'), equal(piece, '\0')));
 }
 
-/* Whether the block may have marks. A byte that is 0 shows it: a NUL, or what remains of a quote, a number sign or a
- * slash, and of five other characters, when the bits in which these three differ are ignored. */
+/* True if the block may have marks. When the bits in which a quote, a number sign and a slash differ are ignored, these
+ * three, and five other characters, become 0, as a NUL is; so the test is for a byte that is 0. */
 bool may_have_marks(const char *bytes) {
     constexpr char DIFFERENCES = ('"' ^ '#') | ('"' ^ '/');
     __m128i least = _mm_set1_epi8(-1);

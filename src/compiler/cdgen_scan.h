@@ -24,7 +24,7 @@ block_bits scan_block_by_words(const char *bytes);
 /* A set of places in a buffer. */
 class place_set {
 public:
-    /* The first place at or after this one. There must be one. */
+    /* The first place in the set that is not before this one. There must be such a place. */
     size_t first_from(size_t place) const {
         size_t block = place / SCAN_BLOCK;
         if (uint64_t rest = words[block] >> place % SCAN_BLOCK)

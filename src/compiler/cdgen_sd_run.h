@@ -6,12 +6,12 @@
 
 #include <cstddef>
 
-/* What the open element has supplied. */
+/* Which attributes the open element has given. */
 struct sd_element_state {
     bool is_complete() const {
         return sd_dt_found && sd_disp_found && sd_name_found && sd_desc_found;
     }
-    /* Valid values are forgotten apart: they need not be given. */
+    /* Valid values are cleared separately, because they are optional. */
     void forget() {
         sd_dt_found = sd_disp_found = sd_name_found = sd_desc_found = 0;
     }
@@ -26,11 +26,11 @@ struct sd_element_state {
     int sd_vv_found = 0;
 };
 
-/* Whom the elements of a run belong to. */
+/* The owner of a run of elements. */
 enum class sd_run_state {
     NO_OWNER,     /* nobody yet: the owner is looked up when a run begins */
     OF_ATTRIBUTE, /* an attribute, whose value the elements make */
-    OF_FIELD      /* a class or an action, or nobody: a field refers to the section, and there is no value */
+    OF_FIELD      /* a class or an action, or nobody: a field refers to the section, and the elements make no value */
 };
 
 /* A run of elements. It is open while the staging record cb_sd_def is.
@@ -50,7 +50,7 @@ public:
         max_sd_idx = highest_index;
         sd_attr_type = type;
     }
-    /* An owner that is known already stays. field may be null: then there is still none. */
+    /* Keeps an owner that is already known. field may be null; the run then still has no owner. */
     void belong_to(cdb_ref_t *field) {
         if (curr_sd_tbl != nullptr || field == nullptr)
             return;
@@ -73,7 +73,7 @@ public:
             *max_sd_idx = static_cast<vx_uint16_t>(curr_sdeli);
         restart_indexes();
     }
-    /* What was given to the owner stays. */
+    /* What the owner has already been given is kept. */
     void forget_owner() {
         now = sd_run_state::NO_OWNER;
         attr_dflt_val = nullptr;
@@ -94,7 +94,7 @@ public:
     bool makes_value() const {
         return now == sd_run_state::OF_ATTRIBUTE;
     }
-    /* The value that the elements make; null if they make none. */
+    /* The value that the elements make; null if they do not make a value. */
     vx_value_t *value() const {
         return attr_dflt_val;
     }
@@ -102,11 +102,11 @@ public:
     cdb_ref_t *section() const {
         return curr_sd_tbl;
     }
-    /* Of the attribute; null for other owners. */
+    /* The type of the attribute's value; null for other owners. */
     vx_uint16_t *highest_index() const {
         return max_sd_idx;
     }
-    /* Of the latest attribute announced: 0 persistent, 1 dynamic. */
+    /* The kind of the latest attribute that was announced: 0 persistent, 1 dynamic. */
     int attribute_type() const {
         return sd_attr_type;
     }
@@ -126,7 +126,7 @@ public:
     int expected_index() const {
         return expected_sdeli;
     }
-    /* One element more is part of the value. */
+    /* Counts one more element of the value. */
     void count_element() {
         ++sd_num_elems;
     }

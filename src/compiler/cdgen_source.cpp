@@ -47,7 +47,7 @@ bool refill(cdgen &cx) {
     return n > 0;
 }
 
-/* The next line, of so many bytes, in the buffer. */
+/* Takes the next line, of this many bytes, from the buffer. */
 source_line whole_line(source_file &source, size_t length) {
     size_t place = source.pos;
     char *begin = source.buffer.data() + place;
@@ -63,7 +63,7 @@ source_line whole_line(source_file &source, size_t length) {
             place};
 }
 
-/* The next bytes, which no newline follows, in inbuf. */
+/* Copies the next bytes, which no newline follows, to inbuf. */
 source_line cut_line(cdgen &cx, size_t length) {
     source_file &source = cx.source.cdb_fp;
     size_t place = source.pos;

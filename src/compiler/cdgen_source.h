@@ -26,7 +26,7 @@ struct source_file {
     void close();
 
     int fd = -1;             /* -1: the source is in memory */
-    std::string_view memory; /* of such a source, what has not been read */
+    std::string_view memory; /* the rest of such a source, which has not been read */
     dev_t device = 0;
     ino_t inode = 0;
     size_t pos = 0;  /* of the first byte of buffer not yet taken */
@@ -52,7 +52,7 @@ struct attr_text {
 
 /* A line in the read buffer; its end is the place of its newline. A line without a newline is copied to inbuf. */
 struct source_line {
-    char *begin; /* null: the source has no more lines */
+    char *begin; /* null: the end of the source */
     char *end;
     const char *read_end; /* of the bytes that follow in the buffer */
     char *mark;           /* the first mark; at or after end if the line has none */
@@ -63,13 +63,14 @@ struct source_line {
 /* Fatal if the source cannot be opened or, later, read. */
 void open_source(cdgen &cx, const char *filename);
 
-/* The same for a descriptor that is open, or -1 with errno; it is the context's from now on. */
+/* The same for an open descriptor, or -1 with errno. The context owns it from now on. */
 void take_source(cdgen &cx, const char *filename, int fd);
 
-/* The same for a source in memory, which must stay until it has been read. */
+/* The same for a source in memory, which must remain valid until it has been read. */
 void take_source(cdgen &cx, std::string_view bytes);
 
-/* The next line, or the next LINE_MAX_CHARS bytes of a longer one, and counts it. It stays until the next call. */
+/* Returns the next line, or the next LINE_MAX_CHARS bytes of a longer one, and counts it. It is valid until the next
+ * call. */
 source_line next_line(cdgen &cx);
 
 /* A line's text: the line without its comment, and without trailing blanks and hash signs, even quoted ones. Its end is

@@ -1,4 +1,4 @@
-/* cdgen_staging.h: what the stanzas of a source fill: records, tables of records, and what waits for later lines. */
+/* cdgen_staging.h: what the stanzas of a source fill: records, tables of records, and data that later lines need. */
 #ifndef CDGEN_CDGEN_STAGING_H
 #define CDGEN_CDGEN_STAGING_H
 
@@ -40,7 +40,7 @@ struct section_tables {
 
 constexpr size_t LOCATOR_SIZE = VALUE_MAX_CHARS + 1; /* the longest value and its NUL */
 
-/* A Locator that waits for the attribute it names. */
+/* A Locator, kept until the attribute that it names is known. */
 struct _rc_locator_t {
     vx_uint16_t *ptr = nullptr; /* the field to fill; null while none was given */
     char name[LOCATOR_SIZE] = {};

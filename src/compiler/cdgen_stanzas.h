@@ -1,4 +1,4 @@
-/* cdgen_stanzas.h: where the compiler stages what the stanzas of a kind say. */
+/* cdgen_stanzas.h: where the compiler stages the stanzas of each kind. */
 #ifndef CDGEN_CDGEN_STANZAS_H
 #define CDGEN_CDGEN_STANZAS_H
 

@@ -1,4 +1,4 @@
-/* cdgen_swap.cpp: turns a finished image into the other byte order, by the field tables of its records. */
+/* cdgen_swap.cpp: reverses the byte order of a finished image, using the field tables of its records. */
 
 #include "compiler/cdgen_swap.h"
 
@@ -16,7 +16,7 @@ using cdb::field;
 using cdb::field_kind;
 using cdb::target;
 
-/* Class bits of the data types, by type; only IS_ARRAY is looked at. */
+/* Class bits of the data types, by type; only IS_ARRAY is used. */
 constexpr vx_uint16_t cu_dtc_table_1[] = {0x0000, 0x0002, 0x0023, 0x0023, 0x0023, 0x0023, 0x0023, 0x0023,
                                           0x000F, 0x000F, 0x000F, 0x0007, 0x000C, 0x001F, 0x001F, 0x001F,
                                           0x001F, 0x001F, 0x001F, 0x0017, 0x0017, 0x0017, 0x0017};
@@ -56,10 +56,11 @@ bool is_array(vx_data_type_t type) {
     return known_type(type) && (cu_dtc_table_1[type] & IS_ARRAY) != 0;
 }
 
-/* The tables are known while compiling: taken apart field by field, there remains only what is to be done. */
+/* The tables are known at compile time, so each field is expanded to just the code that it needs. */
 template <const auto &fields> constexpr auto rows = std::make_index_sequence<std::size(fields)>();
 
-/* Numbers whole, references in their first word; values are turned elsewhere, because their type must be known. */
+/* Reverses whole numbers, and the first word of references. Values are reversed elsewhere, because their type must be
+ * known. */
 template <const auto &fields, size_t row> void swap_field(char *record) {
     constexpr field f = fields[row];
     constexpr bool reference = f.kind == field_kind::reference;
@@ -137,7 +138,7 @@ void swap_out_of_line(vx_uint32_t offset, vx_data_type_t type, swap_area &sbase_
     --sbase_p.nesting;
 }
 
-/* What its elements would lead to is not followed. */
+/* The references in its elements are not followed. */
 void swap_array_alone(vx_uint32_t offset, vx_data_type_t type, swap_area &sbase_p) {
     unsigned nesting = std::exchange(sbase_p.nesting, swap_area::NESTING_MAX - 1);
     swap_out_of_line(offset, type, sbase_p);
@@ -172,7 +173,7 @@ void follow_sd_def(vx_uint32_t offset, const swap_areas &areas) {
         swap_sd_def(sd, areas.vvbase_p, areas.sbase_p);
 }
 
-/* What a record refers to in the class's list tables. type: that of the record's values. */
+/* Reverses what a record refers to in the class's list tables. type: that of the record's values. */
 template <const auto &fields, size_t row>
 void follow_reference(const char *record, vx_data_type_t type, const swap_areas &areas) {
     constexpr field f = fields[row];
@@ -213,12 +214,12 @@ struct swap_section {
     size_t length;
     cell_places to_numbers = {};
 
-    /* size bytes from offset on lie inside. */
+    /* True if size bytes from offset on are inside. */
     bool holds(size_t offset, size_t size) const {
         return offset <= length && size <= length - offset;
     }
 
-    /* As many of count records of size bytes from offset on as lie inside. */
+    /* How many of count records of size bytes from offset on are inside. */
     vx_uint32_t records_inside(size_t offset, vx_uint32_t count, size_t size) const {
         size_t room = offset <= length ? (length - offset) / size : 0;
         return static_cast<vx_uint32_t>(std::min<size_t>(count, room));
@@ -249,7 +250,7 @@ void swap_tables(const swap_section &section, const rsrc_class_t &rc, size_t fir
     }
 }
 
-/* List tables are reversed only where something refers to them; the string table only where there is a value. */
+/* List tables are reversed only where something refers to them, and the string table only where it holds a value. */
 void swap_class(const swap_section &section) {
     if (!section.holds(0, sizeof(rsrc_class_t)))
         return;
@@ -314,7 +315,8 @@ void swap_section_of(const cdb_dsect_anchor_t &anchor, const swap_section &secti
     }
 }
 
-/* Marks the words that look like references but are not as absent while the image is walked. Returns what they were. */
+/* Sets the words that only look like references to "none" while the image is walked. Returns their previous contents.
+ * */
 std::vector<vx_uint32_t> hide_strays(char *image, std::span<const size_t> places) {
     std::vector<vx_uint32_t> words;
     for (size_t place : places) {

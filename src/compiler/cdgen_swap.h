@@ -12,7 +12,7 @@
 
 /* Reverses the byte order of a finished image in place. nowhere: places in the image of words that look like references
  * and are not; they are reversed, but not followed. to_numbers: places, ascending, of references to arrays of numbers
- * where the type says arrays of something else; what the elements would lead to is left alone. */
+ * whose record has another array type; their elements are not followed. */
 void cdgen_cdef_swap(char *cdb_hdr_p, std::span<const size_t> nowhere = {}, std::span<const size_t> to_numbers = {});
 
 /* Cells of an image, by their places in it, ascending. */
@@ -25,16 +25,17 @@ struct cell_places {
     }
 };
 
-/* A table that references lead into. Hands out each thing in it once, and only what lies inside. */
+/* A table that references lead into. Returns each item in it only once, and only if it is inside. */
 class swap_area {
 public:
     swap_area(char *start, size_t bytes) : base(start), size(bytes), taken(bytes / ALIGNMENT) {}
 
-    /* The address of the item at an offset: a head of head bytes, in which the word at count_at says how many
-     * entries of entry bytes follow. Null if it is not all inside, or if it has been handed out before. */
+    /* The address of the item at an offset: a head of head bytes, in which the word at count_at says how many entries
+     * of entry bytes follow. Null if some of it is outside, or if it has been returned before. */
     char *take(vx_uint32_t offset, size_t head, size_t count_at = 0, size_t entry = 0);
 
-    /* Values inside values, at most so many deep: recursion must end whatever a file says. (The compiler writes 4.) */
+    /* The greatest depth of values inside values, because recursion must end whatever the file contains. (The compiler
+     * writes at most 4.) */
     static constexpr unsigned NESTING_MAX = 64;
     unsigned nesting = 0;   /* values being reversed */
     cell_places to_numbers; /* their arrays are reversed, but the elements are not followed */

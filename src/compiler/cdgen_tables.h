@@ -17,13 +17,13 @@
 
 struct cdgen;
 
-/* The bytes of a table; all that is kept of a table once it is finished. */
+/* The bytes of a table, which is all that is kept when the table is finished. */
 struct tbl_content {
     size_t used() const {
         return static_cast<size_t>(tbl_next - tbl_base);
     }
 
-    /* Gives the block back, if it is one of its own. */
+    /* Frees the block, unless it belongs to a pool. */
     void release();
     /* Gives back the first bytes of a block that is reserved, a multiple of RESERVE_FROM and less than it holds. */
     void release_front(size_t bytes);
@@ -32,11 +32,11 @@ struct tbl_content {
     char *tbl_next = nullptr;       /* first unreserved byte */
     const char *tbl_name = nullptr; /* for traces and messages */
     memory_owner tbl_owner = memory_owner::HEAP;
-    size_t tbl_capacity = 0; /* bytes really held */
+    size_t tbl_capacity = 0; /* bytes allocated */
 };
 
 /* An append-only arena of zero-filled bytes. It grows by whole allocation units, and so does tbl_size, which the traces
- * show; memory is allocated in larger steps, and a large table gets address space for all that it may ever hold. The
+ * show. Memory is allocated in larger steps, and a large table gets address space for its largest possible size. The
  * block moves when it grows beyond what it has, so references into a table are offsets from tbl_base. Once there is a
  * block, tbl_next < tbl_end and all bytes between them are 0. */
 struct tbl : tbl_content {
@@ -45,9 +45,10 @@ struct tbl : tbl_content {
     tbl &operator=(const tbl &) = delete;
     ~tbl();
 
-    /* Empty, as if it were new; the block waits for the first reservation. */
+    /* Empties the table. It keeps its block for the next reservation. */
     void restart(const char *name);
-    /* Empty, as after a first reservation of no bytes; what a trace would say of that is not said. */
+    /* Empties the table as if no bytes had been reserved in it for the first time, but without the trace of such a
+     * reservation. */
     void restart_untraced(const char *name);
 
     size_t room() const {
@@ -61,32 +62,32 @@ struct tbl : tbl_content {
     char *tbl_spare = nullptr;     /* the block before the first reservation, if there is one already */
 };
 
-/* The offset in a string table of the container that is being filled; nothing until the first element is added. */
+/* The offset in a string table of the container that is being filled; no value until the first element is added. */
 using tbl_anchor = std::optional<vx_uint32_t>;
 
 constexpr size_t round8(size_t n) {
     return (n + 7) & ~size_t{7};
 }
 
-/* Zero-filled memory, to be given back with free(). Failing is fatal, with errno as the status. */
+/* Returns zero-filled memory, to be freed with free(). Failure is fatal, with errno as the status. */
 void *cfg_malloc(size_t s);
 
-/* A new, empty table that stays until it is filed, or as long as the context. */
+/* A new, empty table that exists until it is filed, or as long as the context. */
 tbl *make_tbl(cdgen &cx, size_t au, const char *name);
 
-/* Reserves s bytes, zeroed, at the end of t. The address holds until the next reservation in t. */
+/* Reserves s bytes, zeroed, at the end of t. The address is valid until the next reservation in t. */
 inline void *alloc_tble(cdgen &cx, tbl *t, size_t s); /* cdgen_context.h has its body */
 
-/* Its rarer part: traces the reservation, and makes s more bytes fit in front of the end of t. */
+/* The rare part of reserve(): traces the reservation, and makes room for s more bytes in t. */
 void make_room(cdgen &cx, tbl &t, size_t s);
 
-/* Gives back what a table does not use, down to tbl_next. */
+/* Frees the unused memory of a table after tbl_next. */
 void trim_tbl(tbl *t);
 
-/* Moves a finished table's bytes to compact storage and points the record at them, or at nothing if there are none.
- * With many classes, the unused rest would be most of the memory. The table itself is reused. */
+/* Moves a finished table's bytes to compact storage and points the record at them, or at nothing if there are no bytes.
+ * With many classes, most of the memory would otherwise be unused. The table itself is reused. */
 void file_tbl(cdgen &cx, cdb_ref_t &ref);
-/* Gives back a filed table's bytes. Of several tables, the latest one comes first. */
+/* Frees a filed table's bytes. Several tables must be freed in the reverse order of their filing. */
 void drop_filed(cdgen &cx, const cdb_ref_t &ref);
 
 /* Appends len bytes, zero-filled up to a multiple of 8; returns their offset from tbl_base. add_to_tbl is the name that
@@ -102,7 +103,7 @@ template <class Record> Record *record_at(tbl_content *t, size_t offset) {
     return static_cast<Record *>(tbl_at(t, offset, sizeof(Record)));
 }
 
-/* All records of a table that holds nothing else. */
+/* All records of a table that contains nothing else. */
 template <class Record> std::span<Record> records_of(tbl_content *t) {
     if (t == nullptr || t->tbl_base == nullptr)
         return {};
@@ -137,7 +138,7 @@ public:
 
     /* n zeroed bytes, aligned for any value, that stay until the pool is emptied. Null if there is no memory. */
     char *take(size_t n);
-    /* Gives back what was taken at this address and after it, if that is in the latest chunk. */
+    /* Frees the memory at this address and after it, if it is in the latest chunk. */
     void give_back_from(const char *taken);
     /* Frees everything except the latest chunk, which is reused. */
     void clear();

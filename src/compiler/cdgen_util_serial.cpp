@@ -6,7 +6,7 @@
 
 namespace {
 
-/* 100, the default upper bound, as a number of a type. */
+/* 100, the default upper bound, as a number of the type. */
 vx_value_t hundred(vx_data_type_t type) {
     if (type == VX_FLOAT32)
         return {.val_float32 = 100.0F};
@@ -17,7 +17,7 @@ vx_value_t hundred(vx_data_type_t type) {
     return {.val_int32 = 100};
 }
 
-/* One value on its way into a cell. */
+/* A value that is being written to a cell. */
 struct encoding {
     cdgen &cx;
     const vx_value_t *in; /* TYPE_SAME and TYPE_16 only */
@@ -31,7 +31,7 @@ void store_offset(vx_value_t &cell, vx_uint32_t offset) {
     memcpy(&cell, &offset, sizeof offset);
 }
 
-/* The low 16 bits into the first two bytes; integers outside arrays only. */
+/* Stores the low 16 bits in the first two bytes. For integers outside arrays only. */
 int encode_16(vx_value_t &cell, const encoding &e) {
     size_t width = number_width(e.type);
     if (width == 0 || e.type == VX_FLOAT32 || e.type == VX_FLOAT64 || e.in_array)
@@ -105,7 +105,7 @@ int encode_text(vx_value_t &cell, const encoding &e) {
     }
 }
 
-/* Whatever the value and the mode: all zero. */
+/* All zeros, whatever the value and the mode. */
 int encode_handle(vx_value_t &cell, const encoding &e) {
     constexpr vx_resource_handle_t handle = {};
     append(cell, e, &handle, sizeof handle);
@@ -124,7 +124,7 @@ int encode(vx_value_t &cell, const encoding &e) {
     return e.type == VX_CHAR_PTR || e.type == VX_BINARY_PTR ? encode_text(cell, e) : encode_number(cell, e);
 }
 
-/* A reservation in the string table, as an offset. */
+/* Reserves bytes in the string table and returns their offset. */
 vx_uint32_t reserve(cdgen &cx, tbl *str_tbl, size_t size) {
     auto *reserved = static_cast<char *>(alloc_tble(cx, str_tbl, round8(size)));
     return static_cast<vx_uint32_t>(reserved - str_tbl->tbl_base);
@@ -168,7 +168,7 @@ vx_uint32_t init_array(cdgen &cx, tbl *str_tbl, tbl_anchor *anchor, vx_uint32_t 
 }
 
 vx_uint32_t init_scalar_sd(cdgen &cx, tbl *str_tbl, tbl_anchor *anchor, vx_uint32_t sd_cnt, vx_value_t *out_data) {
-    if (sd_cnt == 0) { /* always a fresh one */
+    if (sd_cnt == 0) { /* always a new one */
         *anchor = reserve(cx, str_tbl, sizeof(vx_structured_data_t));
         store_offset(*out_data, **anchor);
         return **anchor;

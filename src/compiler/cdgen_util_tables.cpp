@@ -89,8 +89,8 @@ size_t growth_chunk(const tbl &t, size_t s) {
     return chunk >= s ? chunk : (s + t.tbl_au - 1) / t.tbl_au * t.tbl_au;
 }
 
-/* Takes a block for the table's first or next bytes from the heap. Half as much again is asked for, so that a table
- * does not move at every unit; if there is not that much memory, just what is needed. */
+/* Takes a block for the table's first or next bytes from the heap. Asks for half as much again, so that the table does
+ * not move with every unit; if there is not enough memory for that, asks for just what is needed. */
 bool take_from_heap(tbl &t, size_t needed) {
     size_t generous = std::max(needed, t.tbl_capacity + t.tbl_capacity / 2);
     for (size_t capacity : {generous, needed}) {
@@ -118,7 +118,7 @@ bool take_reserved(tbl &t, size_t needed) {
     return true;
 }
 
-/* A block that is large enough, with what the table holds; false if there is no memory. */
+/* Gives the table a block that is large enough and moves its contents there. Returns false if there is no memory. */
 bool take_block(tbl &t, size_t needed) {
     if (needed >= RESERVE_FROM && take_reserved(t, needed))
         return true;
@@ -205,8 +205,8 @@ void *tbl_at(tbl_content *t, size_t offset, size_t size) {
     return t->tbl_base + offset;
 }
 
-/* A pool grows by chunks that hold several lines' values, each twice as large as the one before; the latest serves
- * again after clear(). */
+/* A pool grows by chunks for the values of several lines, each twice as large as the one before. clear() keeps the
+ * latest chunk for reuse. */
 struct text_pool::chunk {
     chunk *next;
     size_t size; /* bytes that follow */

@@ -30,7 +30,7 @@ constexpr auto type_names = with_lengths(vxTypeStr);
 constexpr auto variable_names = with_lengths(vxVarStr);
 constexpr name_index type_index(type_names.size(), [](size_t i) { return type_names[i]; });
 
-/* A call into the C library's conversions with errno as they alone know it. */
+/* Calls one of the C library's conversions with the errno of earlier conversions. */
 template <class Convert> auto converted(cdgen &cx, Convert convert) {
     int outside = errno;
     errno = cx.conv_errno;
@@ -44,12 +44,13 @@ bool conversion_failed(const cdgen &cx) {
     return cx.conv_errno == ERANGE || cx.conv_errno == EINVAL;
 }
 
-/* Digits alone, of a number that fits: the C library's result without calling it. False where its rules are wanted. */
+/* Converts plain digits of a number that fits, with the same result as the C library. Returns false for any other text,
+ * for which the C library's rules are needed. */
 bool plain_unsigned(std::string_view text, vx_uint64_t *value) {
     return all_digits(text, value);
 }
 
-/* The same with a minus sign in front, or without. */
+/* The same, with or without a minus sign. */
 bool plain_signed(std::string_view text, vx_int64_t *value) {
     bool negative = text.starts_with('-');
     vx_uint64_t size = 0;
@@ -58,8 +59,8 @@ bool plain_signed(std::string_view text, vx_int64_t *value) {
     return plain;
 }
 
-/* Digits with or without a fraction, such that they as an integer and the power of ten are exact: the one division
- * rounds as the C library does. */
+/* Converts digits, with or without a fraction, if the digits as an integer and the power of ten are exact. The single
+ * division then rounds as the C library does. */
 template <class Float> bool exact_fraction(std::string_view text, Float *value) {
     constexpr vx_uint64_t EXACT = vx_uint64_t{1} << std::numeric_limits<Float>::digits;
     constexpr size_t EXACT_POWER = sizeof(Float) == sizeof(float) ? 10 : 18; /* of ten; and no overflow of n */
@@ -84,8 +85,9 @@ template <class Float> bool exact_fraction(std::string_view text, Float *value) 
     return rounded_once && n - 1 < EXACT && text.size() <= EXACT_POWER;
 }
 
-/* A decimal number that is normal, and so rounded as the C library rounds it. False where its rules are wanted: for
- * white space, plus signs, hexadecimal numbers, and what it reports in errno. */
+/* Converts a decimal number that is normal, and is therefore rounded as the C library rounds it. Returns false where
+ * the C library's rules are needed: for white space, plus signs, hexadecimal numbers, and results that it reports in
+ * errno. */
 template <class Float> bool plain_float(std::string_view text, Float *value) {
     if (exact_fraction(text, value))
         return true;
@@ -99,7 +101,7 @@ template <class Float> bool plain_float(std::string_view text, Float *value) {
     return converted(cx, [&] { return strtoll(text, end, base); });
 }
 
-/* The whole text as a decimal integer: false when anything else follows. */
+/* Converts the whole text as a decimal integer. Returns false if anything else follows. */
 bool whole_signed(cdgen &cx, std::string_view text, vx_int64_t *value) {
     if (plain_signed(text, value))
         return true;
@@ -125,14 +127,14 @@ bool whole_float(cdgen &cx, std::string_view text, Float *value, Float (*convert
     return *end == '\0';
 }
 
-/* A value that the library also returns for text it cannot convert is refused while errno says that it could not. Which
- * may be because of an earlier text: deliberately, nothing clears it. */
+/* A value that the library also returns for text that it cannot convert is refused while errno is set. An earlier text
+ * may have set it; deliberately, nothing clears it. */
 template <class Integer> bool suspicious(Integer value) {
     using limits = std::numeric_limits<Integer>;
     return value == 0 || value == limits::max() || (limits::is_signed && value == limits::min());
 }
 
-/* Deliberately not symmetric: NaN and negative infinity are taken. */
+/* Deliberately not symmetric: NaN and negative infinity are accepted. */
 template <class Float> bool suspicious_float(Float value) {
     using limits = std::numeric_limits<Float>;
     return value == 0 || value >= limits::max() || value == limits::min();
@@ -201,8 +203,8 @@ int string_from_text(cdgen &, vx_value_t *out, std::string_view text, text_pool 
     return 0;
 }
 
-/* Text that starts with 0 is hexadecimal and must have an x next; any other has escapes. The block is zeroed and large
- * enough for the bytes that a reader of the block takes from behind the escapes' decoded text. */
+/* Text that starts with 0 is hexadecimal, and x must follow; any other text may have escapes. The block is cleared, and
+ * large enough for the bytes that are later copied from after the decoded text. */
 int binary_from_text(cdgen &cx, vx_value_t *out, std::string_view text, text_pool &pool) {
     char *block = pool.take(sizeof(vx_uint32_t) + text.size() + sizeof(vx_uint32_t));
     if (block == nullptr)
@@ -228,8 +230,8 @@ int hex_digit(char c) {
     return -1;
 }
 
-/* The number after a backslash, of at most three characters, which *p is moved over. -1 if there is none. Blanks and a
- * sign count as characters of it. */
+/* The number after a backslash, of at most three characters, after which *p is moved; -1 if there is no number. Blanks
+ * and a sign count as characters. */
 vx_int64_t octal_escape(cdgen &cx, const char **p) {
     char digits[4] = {};
     strncpy(digits, *p, 3);
@@ -266,7 +268,7 @@ std::optional<orb_variable_type_t> variable_type_named(std::string_view name) {
 vx_int64_t int_from_text(cdgen &cx, std::string_view text, char **end, int base) {
     vx_uint64_t plain = 0;
     bool digits = plain_unsigned(text, &plain);
-    if (!digits || base == 8 || (base == 0 && text[0] == '0' && text.size() > 1)) /* or not decimal ones */
+    if (!digits || base == 8 || (base == 0 && text[0] == '0' && text.size() > 1)) /* or not decimal digits */
         return library_integer(cx, text.data(), end, base);
     if (end != nullptr)
         *end = const_cast<char *>(text.data() + text.size());
@@ -314,7 +316,7 @@ int oct_convert(cdgen &cx, const char *p, int type, char *out_buf) {
     }
     if (type == 1)
         *out = '\0';
-    else /* deliberately over the first four bytes: the data that follow begin with the fifth */
+    else /* deliberately over the first four bytes, so the data begin with the fifth */
         store_length(out_buf, static_cast<size_t>(out - out_buf));
     return 0;
 }

@@ -12,7 +12,7 @@
 #include <optional>
 #include <string_view>
 
-/* What is serialised. */
+/* What a value is written for. */
 enum type_out_mode {
     TYPE_SAME = 1, /* the given value */
     TYPE_16 = 2,   /* the given integer, narrowed to 16 bits */
@@ -23,13 +23,13 @@ enum type_out_mode {
     R_HI_DEFAULT = 7  /* a range's upper bound */
 };
 
-/* The code of a type's source name; VX_UNKNOWN for unknown names and "UNKNOWN" itself. */
+/* The code of a data type by its name in sources; VX_UNKNOWN for unknown names and for "UNKNOWN" itself. */
 vx_data_type_t data_type_named(std::string_view name);
-/* The code of a variable type's name; nothing for another. */
+/* The code of a variable type by its name; no value for an unknown name. */
 std::optional<orb_variable_type_t> variable_type_named(std::string_view name);
 
-/* In what follows, a text ends with a NUL. Integers of 64 bits, on every machine, by the rules of the C library, base
- * 0, 8 or 10. An overflow is remembered in cx.conv_errno. */
+/* In the following functions, a text ends with a NUL. Integers of 64 bits, on every machine, by the rules of the C
+ * library, base 0, 8 or 10. An overflow is remembered in cx.conv_errno. */
 vx_int64_t int_from_text(cdgen &cx, std::string_view text, char **end, int base);
 
 /* Converts text into *vx_out, for an array type into one element; 0, or -1 if the text is not a value of the type.
@@ -50,13 +50,13 @@ int ver_str_convert(cdgen &cx, const char *ver_str, vx_uint32_t *n);
 /* Ends the text at its first comma and returns what follows; null without a comma. */
 char *getNextArrVal(char *line);
 
-/* The bytes of its cell that a number of a type takes; 0 for what is no number. */
+/* How many bytes of its cell a number of the type takes; 0 for a type that is not a number. */
 constexpr size_t number_width(vx_data_type_t type) {
     constexpr std::array<unsigned char, VX_FLOAT64 + 1> widths = {0, 0, 4, 4, 8, 8, 4, 8};
     return static_cast<size_t>(type) < widths.size() ? widths[type] : 0;
 }
 
-/* Copies a number into its cell; false, and nothing is done, for another type. */
+/* Copies a number into its cell. For any other type it does nothing and returns false. */
 inline bool copy_number(vx_value_t &cell, const vx_value_t &number, vx_data_type_t type) {
     size_t width = number_width(type);
     if (width == 8)
@@ -72,7 +72,7 @@ inline bool copy_number(vx_value_t &cell, const vx_value_t &number, vx_data_type
 int copy_this_type(cdgen &cx, vx_value_t *out_data, const vx_value_t *in_data, vx_data_type_t type_in, int type_out,
                    tbl *str_tbl, tbl_anchor *array_anchor, vx_uint32_t array_cnt);
 
-/* The anchors of one structured value in the making. */
+/* The offsets of the parts of a structured value that is being made. */
 struct sd_anchors {
     tbl_anchor array;      /* of the element's own array */
     tbl_anchor sd_array;   /* of the array of structured data */
@@ -84,9 +84,9 @@ struct sd_anchors {
 int copy_this_sd_type(cdgen &cx, vx_value_t *out_data, vx_data_type_t type_in, int type_out, tbl *str_tbl,
                       sd_anchors *anchors, vx_uint32_t array_cnt, vx_data_type_t sd_type);
 
-/* Make the container if the anchor is empty, storing its offset in *out_data, and count one element more. Return the
- * offset of that element: of its value cell for an array, of the whole element for structured data (of the structure if
- * sd_cnt is 0). */
+/* These functions make the container if the anchor is empty, storing its offset in *out_data, and count one more
+ * element. Return the offset of that element: of its value cell for an array, of the whole element for structured data
+ * (of the structure if sd_cnt is 0). */
 vx_uint32_t init_array(cdgen &cx, tbl *str_tbl, tbl_anchor *anchor, vx_uint32_t array_cnt, vx_value_t *out_data);
 vx_uint32_t init_scalar_sd(cdgen &cx, tbl *str_tbl, tbl_anchor *anchor, vx_uint32_t sd_cnt, vx_value_t *out_data);
 vx_uint32_t init_array_sd(cdgen &cx, tbl *str_tbl, tbl_anchor *array_anchor, tbl_anchor *sd_anchor,

@@ -1,4 +1,4 @@
-/* given_interface.cpp: functions that are laid down and that nothing in the program calls. */
+/* given_interface.cpp: functions of the fixed interface that nothing in the program calls. */
 
 #include "compiler/given_interface.h"
 

@@ -17,9 +17,9 @@ namespace check {
 
 namespace {
 
-constexpr size_t RETURNS_MAX = 65536; /* carriage returns that are removed at once, for the memory that they take */
+constexpr size_t RETURNS_MAX = 65536; /* the most carriage returns that are removed together, to limit memory */
 
-/* One check of one source, whose name must stay as long. */
+/* One check of one source, whose name must outlive it. */
 struct source_check {
     source_check(const std::string &name, const warning_set &wanted, const sink &handed_to, const compile_job *compile)
         : job(compile), compiler(name.c_str(), job == nullptr ? nullptr : job->output.c_str()), to(handed_to),
@@ -65,8 +65,8 @@ bool removes_returns(const edit &each) {
     return each.text.empty() && each.removed.starts_with('\r');
 }
 
-/* With its places in the file. The first finding about a carriage return removes those of all lines, as far as the
- * source has been read. */
+/* Passes on a finding with its places in the file. The first finding about a carriage return gets the edits that remove
+ * those of all lines read so far. */
 void source_check::hand_over(finding &&each) {
     line.find_in_file(each.at);
     for (note &more : each.notes)
@@ -78,7 +78,7 @@ void source_check::hand_over(finding &&each) {
     to(std::move(each));
 }
 
-/* Whether a finding may still change. */
+/* True if a finding may still change. */
 bool source_check::is_open(warning_id id, int at_line) const {
     return id == CARRIAGE_RETURN || recover.may_retract(id, at_line);
 }
@@ -119,7 +119,7 @@ totals check_bytes(std::string_view bytes, const std::string &name, const warnin
 totals check_file(const std::string &path, const warning_set &wanted, const sink &to, const compile_job *job) {
     auto one = std::make_unique<source_check>(path, wanted, to, job);
     try {
-        if (path == "-") /* by its descriptor: it may not be a file, or be half read */
+        if (path == "-") /* by its descriptor, because it may not be a file, or may be partly read */
             one->compiler.open(fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
         else
             one->compiler.open();

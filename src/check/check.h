@@ -69,7 +69,7 @@ enum warning_id {
 struct warning {
     warning_id id;
     const char *code; /* permanent */
-    const char *name; /* switches it on and off; permanent too */
+    const char *name; /* the name that turns it on and off; permanent too */
     const char *title;
     const char *cause; /* sentences; `names of the language` are in backquotes */
     const char *cure;
@@ -78,17 +78,17 @@ struct warning {
 /* All of them; warnings[id] is the one with that id. */
 extern const std::array<warning, WARNING_COUNT> warnings;
 
-/* By id: whether the warning is wanted. */
+/* By id: true if the warning is wanted. */
 using warning_set = std::array<bool, WARNING_COUNT>;
 
 /* ---- Findings --------------------------------------------------------------------------------------------------- */
 
-/* A part of a line. The compiler counts a line of the file several times if it is too long to be read at once. */
+/* A part of a line. If a line of the file is too long to be read at once, the compiler counts each piece as a line. */
 struct place {
     int line = 0;      /* as the compiler counts lines; 0: none */
     size_t column = 0; /* in bytes, from 1; 0: the whole line */
     size_t length = 0; /* in bytes */
-    /* The same in the file, where a newline ends each line. Set when a finding is handed over. */
+    /* The same in the file, where a newline ends each line. Set when a finding is passed on. */
     int file_line = 0;
     size_t file_column = 0;
 };
@@ -104,16 +104,16 @@ struct edit {
     int line = 0;         /* from 1, each ended by a newline */
     size_t column = 0;    /* in bytes, from 1 */
     size_t character = 0; /* the same in characters */
-    std::string removed;  /* the bytes there; a newline is the last one, if there is any */
+    std::string removed;  /* the bytes there; only the last one may be a newline */
     std::string text;     /* what replaces them */
 };
 
-enum class certainty { likely, certain /* what else could be meant is not in sight */ };
+enum class certainty { likely, certain /* only one correction is possible */ };
 
 /* Edits that cure a finding together. They do not overlap. */
 struct correction {
     certainty sure = certainty::likely;
-    std::vector<edit> edits; /* by place; empty: no cure is known that a program could apply */
+    std::vector<edit> edits; /* by place; empty: a program cannot cure the finding */
 };
 
 struct finding {
@@ -132,8 +132,9 @@ struct totals {
     size_t warnings = 0;
 };
 
-/* Is given each finding, as soon as about a thousand later ones have been found: by line, and the errors of a line
- * before its warnings, but a finding about a line far in front of the others comes when it is found. */
+/* Receives each finding, when about a thousand later ones have been found. Findings are in the order of their lines,
+ * and the errors of a line come before its warnings. A finding about a much earlier line is passed on when it is found.
+ * */
 using sink = std::function<void(finding &&)>;
 
 /* The source cannot be read, or memory ran out. The text names the source. */
@@ -141,16 +142,16 @@ struct cannot_check : std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
-/* What is done with a source that is to be compiled, too. */
+/* How a source is compiled in the pass that checks it. */
 struct compile_job {
-    /* A class without a Name is called after this file, to which nothing is written. */
+    /* A class without a Name is named after this file. Nothing is written to it. */
     std::string output;
-    /* Is given the compilation, all steps of which have been taken, of a source without errors, and the check. */
+    /* Receives the check and the finished compilation of a source without errors. */
     std::function<void(stepwise_compiler &, const view &)> finish;
 };
 
-/* Checks a source that is in memory. Its name appears in cannot_check only, which is thrown if memory
- * runs out. With a job, the same pass compiles it. */
+/* Checks a source that is in memory. Its name is only used for cannot_check, which is thrown if memory runs out. With a
+ * job, the same pass compiles it. */
 totals check_bytes(std::string_view bytes, const std::string &name, const warning_set &wanted, const sink &to,
                    const compile_job *job = nullptr);
 

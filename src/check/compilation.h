@@ -15,8 +15,8 @@ std::string text_of(const fatal_exit &failure);
 
 class compilation : private line_observer, public stepwise_compiler {
 public:
-    /* The names must stay as long as this. output: after which a class without a Name is called; null if it is not
-     * known, and any will do. */
+    /* The names must outlive this object. output: the name after which a class without a Name is named; null if it is
+     * not known and any name will do. */
     compilation(const char *source, const char *output)
         : stepwise_compiler(source, output == nullptr ? CLASS_NAME : output, *this), source_name(source),
           output_name(output) {}
@@ -33,7 +33,7 @@ public:
         attribute = {};
         take_line(text);
     }
-    /* The attribute of the latest line, as far as the compiler came. */
+    /* The attribute of the latest line, if the compiler came so far. */
     const attr_place &latest() const {
         return attribute;
     }
@@ -48,7 +48,7 @@ public:
     /* That is an element. */
     bool has_index(int kind) const;
 
-    /* An error of it has been reported: nothing is missed in it any more. */
+    /* An error of it has been reported, so nothing is reported as missing in it. */
     bool is_broken(int kind) const {
         return broken.test(index_of(kind));
     }

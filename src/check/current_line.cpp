@@ -33,7 +33,7 @@ void current_line::read(const source_line &source, int line_number) {
         rests.push_back(number);
 }
 
-/* Carriage returns are rare. Where the next one is, is found once for all that the buffer holds. */
+/* Carriage returns are rare, so the next one is searched for once in the whole buffer. */
 void current_line::find_return(const source_line &source) {
     bool read_anew = read_end != source.read_end || source.begin <= begin;
     begin = source.begin;

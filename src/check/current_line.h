@@ -36,7 +36,7 @@ public:
      * characters are not in the line. */
     attr_text replaced(std::string_view by, size_t added = 0);
 
-    /* The text without blanks in front, which the compiler may have cut into pieces. */
+    /* The text without leading blanks. The compiler may have cut it into pieces. */
     std::string_view whole() const {
         return {text.name, static_cast<size_t>(text.end - text.name)};
     }
@@ -54,19 +54,19 @@ public:
     place part_of(const attr_place &attr, size_t offset, size_t length) const {
         return {number, column_of(attr.value) + offset, length};
     }
-    /* What an error of this line marks. item: what the error names, if it is a part of the line. */
+    /* The place that an error of this line marks. item: the part of the line that the error names, if it names one. */
     place marked(mark_kind kind, const attr_place &attr, const char *item = nullptr) const;
     /* The text at a place of this line. */
     std::string_view at(const place &part) const {
         return raw.substr(part.column - 1, part.length);
     }
 
-    /* Says where in the file a place of this line, or of one before it, is. */
+    /* Computes where in the file a place of this line, or of an earlier one, is. */
     void find_in_file(place &at) const;
-    /* The change that puts a text in the place of a part of this line, or of one before it that is not the rest of one
-     * that is too long. source: the line's text */
+    /* The edit that replaces a part of this line by a text. It may also be an earlier line, except the rest of one that
+     * is too long. source: the line's text */
     edit replacement(place part, std::string_view source, std::string_view by) const;
-    /* The correction that puts the name that was meant in the place of a part of a line. None if there is no such name,
+    /* The correction that replaces a part of a line by the name that was meant. No correction if there is no such name,
      * or if the line is the rest of one that is too long. */
     correction renamed(const place &part, std::string_view source, const language::guess &meant) const;
     /* The removal of carriage returns at the end of this line; nothing if it has none. */

@@ -18,7 +18,7 @@ place_in_file begin_of(const edit &each) {
     return {each.line, each.column};
 }
 
-/* Behind the bytes that are removed. A newline is the last one of them. */
+/* The place after the bytes that are removed. Only the last of them may be a newline. */
 place_in_file end_of(const edit &each) {
     if (each.removed.ends_with('\n'))
         return {each.line + 1, 1};
@@ -29,10 +29,10 @@ bool comes_first(const edit &a, const edit &b) {
     return begin_of(a) < begin_of(b);
 }
 
-/* What has been changed so far, by its beginning. */
+/* The parts that have been changed so far, by their beginnings. */
 using changed_places = std::set<std::pair<place_in_file, place_in_file>>;
 
-/* Insertions at the same place are not compatible either: their order would not be known. */
+/* Insertions at the same place are not compatible either, because their order would be unknown. */
 bool is_free(const changed_places &changed, const edit &each) {
     auto next = changed.lower_bound({begin_of(each), begin_of(each)});
     bool free_after = next == changed.end() || (end_of(each) <= next->first && begin_of(each) < next->first);

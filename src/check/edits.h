@@ -12,13 +12,14 @@
 
 namespace check {
 
-/* Adds the edits of another correction, except those that are there. The whole is as sure as the less sure of both. */
+/* Adds the edits of another correction, except those that are already there. The result is only as certain as the less
+ * certain of the two. */
 void add(correction &to, correction more);
 
-/* The corrections that can be made together: of two that change the same bytes, the first. */
+/* The corrections that can be made together. If two change the same bytes, the first is chosen. */
 std::vector<correction> compatible(std::vector<correction> all);
 
-/* The source with its corrections made. Nothing if it does not have the bytes that they remove. */
+/* The source with its corrections made. No value if it does not have the bytes that they remove. */
 std::optional<std::string> corrected(std::string_view source, std::span<const correction> all);
 
 } // namespace check

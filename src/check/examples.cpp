@@ -1,5 +1,5 @@
-/* examples.cpp: for each code of a check, a source that it is reported for. A test checks that it is, and that it is
- * not for the cured lines. */
+/* examples.cpp: for each code of a check, a source for which it is reported. A test checks that it is reported for this
+ * source and not for the cured one. */
 
 #include "check/examples.h"
 

@@ -1,4 +1,4 @@
-/* examples.h: for each code of a check, a source that it is reported for. */
+/* examples.h: for each code of a check, a source for which it is reported. */
 #ifndef CDGEN_CHECK_EXAMPLES_H
 #define CDGEN_CHECK_EXAMPLES_H
 
@@ -10,7 +10,7 @@ namespace check {
 /* Lines that make a whole source of an example. */
 struct frame {
     const char *before;
-    const char *shown_before; /* what stands for them where the example is shown */
+    const char *shown_before; /* the text shown in place of these lines */
     const char *after;
 };
 

@@ -1,4 +1,4 @@
-/* findings.cpp: what has been found, on its way to whoever wants it. */
+/* findings.cpp: keeps findings until they can be passed on in order. */
 
 #include "check/findings.h"
 
@@ -68,7 +68,7 @@ void findings::hand_over(entry &each) {
         to(std::move(each.found));
 }
 
-/* Hands over half of what waits, that of the first lines, if too much waits. */
+/* If too many findings are kept, passes on half of them, those of the first lines. */
 void findings::make_room() {
     if (waiting.size() < room)
         return;

@@ -1,4 +1,4 @@
-/* findings.h: what has been found, on its way to whoever wants it. */
+/* findings.h: keeps findings until they can be passed on in order. */
 #ifndef CDGEN_CHECK_FINDINGS_H
 #define CDGEN_CHECK_FINDINGS_H
 
@@ -12,30 +12,30 @@
 
 namespace check {
 
-/* Puts findings in the order of their lines as far as that takes little memory: a finding waits for some others, and is
- * handed over then. */
+/* Puts findings in the order of their lines, as far as that takes little memory: a finding is kept until some later
+ * ones have been found, and then passed on. */
 class findings {
 public:
-    /* Whether warnings of a line may still be taken back; they wait. */
+    /* True if warnings of a line may still be withdrawn; they are kept so long. */
     using question = std::function<bool(warning_id, int line)>;
 
     findings(sink handed_to, question is_open) : to(std::move(handed_to)), may_retract(std::move(is_open)) {}
 
-    /* The finding is to be completed before the next one is added. */
+    /* Returns the finding, which must be completed before the next one is added. */
     finding &error(const message &known, const place &at, std::string_view source, std::string text);
     /* With a note, if it has a text. */
     finding &warn(const warning &known, const place &at, std::string_view source, std::string text, note more);
-    /* Takes back the warnings of a line, which an error now explains. */
+    /* Withdraws the warnings of a line, because an error explains it. */
     void retract(warning_id id, int line);
 
-    /* An error of a line that is completed later. Null if it has been handed over. */
+    /* The error of a line, to be completed later; null if it has been passed on already. */
     finding *waiting_error(message_id id, int line);
 
     size_t errors() const {
         return count.errors;
     }
 
-    /* Hands over all that still waits, and says how many findings there were. */
+    /* Passes on all remaining findings, and returns how many there were in all. */
     totals close();
 
 private:
@@ -56,7 +56,7 @@ private:
     size_t room = WAITING_MAX; /* entries for which make_room() has nothing to do */
     totals count;
 
-    static constexpr size_t WAITING_MAX = 1024; /* findings that need not wait any longer */
+    static constexpr size_t WAITING_MAX = 1024; /* findings that can be passed on */
 };
 
 } // namespace check

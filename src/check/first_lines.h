@@ -15,7 +15,7 @@ namespace check {
 
 class first_lines {
 public:
-    /* The line for a text, to be set; 0 if the text is new. */
+    /* The line for a text, which the caller may set; 0 if the text is new. */
     int &line_of(std::string_view text) {
         return line_of(text, tag_of(text));
     }
@@ -42,17 +42,18 @@ private:
         int line;
     };
     struct slot {
-        unsigned tag;      /* a hash: says where the slot is, and that most other texts need no comparison */
+        unsigned tag;      /* a hash: gives the place of the slot, and shows without a comparison that most other texts
+                            * differ */
         unsigned position; /* in entries, from 1; 0 is free */
     };
 
-    /* The highest 32 bits of the hash, which on a 32-bit machine are all. */
+    /* The highest 32 bits of the hash; on a 32-bit machine, all of it. */
     static unsigned tag_of(std::string_view text) {
         constexpr int LOWER = std::numeric_limits<size_t>::digits - std::numeric_limits<unsigned>::digits;
         return static_cast<unsigned>(std::hash<std::string_view>()(text) >> LOWER);
     }
-    /* Numbers mostly ascend: the slots of eight are close together. Those of more would be searched in vain one after
-     * the other for a number that is not there. */
+    /* Numbers mostly ascend, so the slots of eight of them are close together. If the slots of more were adjacent, the
+     * search for a missing number would take long. */
     static unsigned tag_of(vx_uint32_t number) {
         constexpr unsigned NEAR_BITS = 3, MIX = 0x9E3779B1, SHIFT = 15;
         unsigned mixed = (number >> NEAR_BITS) * MIX;

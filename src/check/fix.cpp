@@ -1,4 +1,4 @@
-/* fix.cpp: corrects what a program can correct in a source. */
+/* fix.cpp: makes the certain corrections of a source. */
 
 #include "check/fix.h"
 
@@ -13,9 +13,9 @@ namespace check {
 
 namespace {
 
-constexpr int ROUNDS_MAX = 200; /* in each of them something is corrected; few are needed */
+constexpr int ROUNDS_MAX = 200; /* the most rounds; few are needed */
 
-/* One round: the corrections of a text are made, except those with which more errors would be found. */
+/* One round: makes the corrections of a text, except those after which there would be more errors. */
 class round {
 public:
     round(std::string_view bytes, const std::string &source, const warning_set &wanted)
@@ -36,7 +36,7 @@ public:
     }
 
 private:
-    /* Makes them together; if that is refused, each half of them. */
+    /* Makes the corrections together; if that causes more errors, tries each half of them. */
     void make(std::span<const correction> some) {
         if (some.empty() || try_with(some))
             return;

@@ -1,4 +1,4 @@
-/* fix.h: corrects what a program can correct in a source. */
+/* fix.h: makes the certain corrections of a source. */
 #ifndef CDGEN_CHECK_FIX_H
 #define CDGEN_CHECK_FIX_H
 
@@ -16,9 +16,9 @@ struct fixed_source {
     size_t dropped = 0;   /* corrections that were not, because more errors would be found with them */
 };
 
-/* Makes the certain corrections of the errors, and of the wanted warnings. The text has no more errors than the bytes
- * had. What becomes visible by a correction is corrected too, so fixing the text again changes nothing. Throws
- * cannot_check, with the source's name, if memory runs out. */
+/* Makes the certain corrections of the errors, and of the wanted warnings. The corrected text has no more errors than
+ * the source. Findings that a correction brings to light are corrected too, so fixing the text again changes nothing.
+ * Throws cannot_check, with the source's name, if memory runs out. */
 fixed_source fix_bytes(std::string_view bytes, const std::string &name, const warning_set &wanted);
 
 } // namespace check

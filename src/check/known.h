@@ -1,4 +1,4 @@
-/* known.h: what a check remembers of the source so far. The driver and the recovery write it; notes and warnings read
+/* known.h: what a check knows about the source so far. The driver and the recovery write it; notes and warnings read
  * it. */
 #ifndef CDGEN_CHECK_KNOWN_H
 #define CDGEN_CHECK_KNOWN_H
@@ -47,7 +47,7 @@ struct refused_attributes {
     bool has_any(std::initializer_list<attr_type> wanted) const {
         return std::any_of(wanted.begin(), wanted.end(), [this](attr_type type) { return types.test(type); });
     }
-    /* Nothing stands for a name that is like none of the kind's. */
+    /* An entry without a value is a name that resembles no attribute of the kind. */
     void add(std::optional<int> type) {
         if (type)
             types.set(index_of(*type));
@@ -67,7 +67,8 @@ struct stanza_record {
     bool is_empty() const {
         return std::all_of(given.begin(), given.end(), [](int line) { return line == 0; });
     }
-    /* Whether a line of it that was refused, or is not its own, may have been meant as an attribute of these types. */
+    /* True if a line that was refused, or that belongs to another stanza, may have been meant as an attribute of these
+     * types. */
     bool may_have_lost(std::initializer_list<attr_type> wanted) const {
         return misplaced || refused.unknown_name || refused.has_any(wanted);
     }
@@ -76,13 +77,13 @@ struct stanza_record {
     std::string source; /* the header's line */
     given_lines given = {};
     int ordinal = 0;      /* among all stanzas, from 1 */
-    bool suspect = false; /* one line of it may belong to another stanza, and none was new since */
+    bool suspect = false; /* true: a line of it may belong to another stanza, and no new attribute has come since */
     refused_attributes refused;
     mention data_type;      /* the value of its DataType */
     bool misplaced = false; /* it seems to contain lines of another stanza */
 };
 
-/* An incomplete stanza, whose missing lines may be found in the stanza after it: a header may stand between them. */
+/* An incomplete stanza whose missing lines may be in the stanza after it, because a header came between them. */
 struct incomplete_stanza {
     int kind = NO_KIND; /* NO_KIND: there is none, or the missing lines are elsewhere */
     given_lines given = {};

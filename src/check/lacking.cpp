@@ -1,4 +1,4 @@
-/* lacking.cpp: what a stanza lacks without the compiler's noticing. */
+/* lacking.cpp: the missing attributes that the compiler does not notice. */
 
 #include "check/lacking.h"
 

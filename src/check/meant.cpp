@@ -1,4 +1,4 @@
-/* meant.cpp: what the names of a source that nothing has were meant to be. */
+/* meant.cpp: the names that the unknown names of a source were meant to be. */
 
 #include "check/meant.h"
 

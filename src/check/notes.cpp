@@ -1,4 +1,4 @@
-/* notes.cpp: what helps to understand an error. */
+/* notes.cpp: notes that help to understand an error. */
 
 #include "check/notes.h"
 
@@ -28,7 +28,7 @@ mention header_of(const stanza_record &stanza) {
     return {stanza.header, {}, stanza.source};
 }
 
-/* One error while its notes are added. */
+/* An error to which notes are added. */
 struct noting {
     const view &see;
     finding &found;
@@ -40,16 +40,16 @@ struct noting {
     void add_here(std::string text) {
         add(found.at, std::move(text));
     }
-    /* For an error in another line, or without any: the line is shown. */
+    /* Shows the line, for an error in another line or without a line. */
     void show(const mention &shown, std::string text) {
         bool is_shown = shown.at.line == found.at.line && found.at.column != 0;
         found.notes.push_back({shown.at, std::move(text), is_shown ? "" : shown.source});
     }
-    /* What was meant takes the place of what is marked. */
+    /* The correction replaces the marked part by what was meant. */
     void replace(const language::guess &meant) {
         found.fix = see.line.renamed(found.at, found.source, meant);
     }
-    /* An element's type that was meant takes the place of the one given, besides what is replaced already. */
+    /* Adds to the correction: the type that was meant replaces an element's type. */
     void replace_type(const mention &given) {
         check::add(found.fix, see.line.renamed(given.at, given.source, language::type_meant_by(given.text, true)));
     }
@@ -336,7 +336,7 @@ std::optional<mention> element_without_index(const view &see) {
     return without.front();
 }
 
-/* The DataType that is none, or that cannot be used where it is. */
+/* The DataType that is unknown, or that cannot be used in its place. */
 std::optional<mention> wrong_type(int kind, const view &see) {
     const std::vector<mention> &odd = see.known.run.odd_types;
     if (is_sd_kind(kind) && !odd.empty())

@@ -1,5 +1,5 @@
-/* notes.h: what helps to understand an error: the name that was meant, where something was first given, what is
- * missing. */
+/* notes.h: notes that help to understand an error: the name that was meant, the place where something was first given,
+ * what is missing. */
 #ifndef CDGEN_CHECK_NOTES_H
 #define CDGEN_CHECK_NOTES_H
 
@@ -14,10 +14,10 @@ namespace check {
 /* kind: that of the stanza at fault; NO_KIND: none. */
 void add_notes(finding &found, const fatal_exit &failure, int kind, const view &see);
 
-/* Whether a value was refused only because an earlier number overflowed, which the notes then say. */
+/* True if a value was refused only because an earlier number overflowed. The notes then say so. */
 bool blames_overflow(const fatal_exit &failure, const view &see);
 
-/* Where the cause of an error is, if that is known and not where the compiler meets it: an earlier line. */
+/* The place of the cause of an error, if it is known and is in an earlier line than the compiler reports. */
 std::optional<mention> cause_of(const fatal_exit &failure, int kind, const view &see);
 
 /* The note for the line in which the compiler meets an error that is reported at its cause. */

@@ -67,7 +67,7 @@ bool is_numeric(vx_data_type_t type) {
 bool number_part::is_plain() const {
     switch (form) {
     case number_form::BITS16:
-    case number_form::INDEX: /* one of more bits may be the first that an attribute cannot store */
+    case number_form::INDEX: /* an index of more bits may be the first that an attribute cannot store */
         return check::is_plain(text, 16);
     case number_form::BITS32:
     case number_form::INT32:
@@ -81,7 +81,7 @@ bool number_part::is_plain() const {
 
 namespace {
 
-/* The compiler refuses what is wrong with numbers of other types. */
+/* The compiler itself refuses wrong numbers of other types. */
 void add_typed(number_parts &parts, vx_data_type_t type, std::string_view text, size_t offset) {
     switch (scalar_vx(type)) {
     case VX_INT32:

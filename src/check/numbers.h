@@ -10,11 +10,11 @@
 
 namespace check {
 
-/* A decimal integer, or with base 0 also an octal or a hexadecimal one; what strtoll makes of a text. */
+/* A decimal integer, or with base 0 also an octal or a hexadecimal one; converted by strtoll. */
 struct number {
     number(std::string_view given, int base);
 
-    /* What follows the number and the blanks after it. */
+    /* The text after the number and the blanks that follow it. */
     std::string_view rest() const;
 
     std::string_view text;
@@ -26,7 +26,8 @@ private:
     void convert(int base);
 };
 
-/* Only decimal digits without a leading 0, which surely fit: up to 65535 in 16 bits, up to 9 digits in 32. */
+/* True if the text has only decimal digits without a leading 0 and fits for certain: up to 65535 in 16 bits, up to 9
+ * digits in 32. */
 bool is_plain(std::string_view text, int bits);
 
 /* "low,high". Without a comma both are the whole text. */
@@ -57,7 +58,7 @@ enum class number_form {
 
 /* A number in the value of an attribute. */
 struct number_part {
-    /* Nothing can be wrong with it: nearly all numbers are plain. */
+    /* True if nothing can be wrong with the number. Nearly all numbers are plain. */
     bool is_plain() const;
 
     std::string_view text;
@@ -84,10 +85,11 @@ private:
     size_t count = 0;
 };
 
-/* The numbers in a value of an attribute type in a stanza of a data type, but those that the compiler itself checks. */
+/* The numbers in a value of an attribute type, in a stanza of a data type, except those that the compiler itself
+ * checks. */
 number_parts numbers_in(int attr_type, vx_data_type_t type, std::string_view value);
 
-/* Whether "low,high" are the wrong way round. Varieties are UInt32 in any base; others are decimal. */
+/* True if "low,high" are the wrong way round. Varieties are UInt32 in any base; others are decimal. */
 bool is_low_above_high(bool variety, vx_data_type_t type, std::string_view value);
 
 } // namespace check

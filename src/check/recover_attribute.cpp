@@ -11,7 +11,7 @@ namespace check {
 
 namespace {
 
-/* Whether an attribute's text is converted as the stanza's data type says. */
+/* True if the attribute's text is converted to the stanza's data type. */
 bool is_typed(int attr_type) {
     switch (attr_type) {
     case AT_VALID_VALUE:
@@ -70,7 +70,8 @@ void recovery::settle_order() {
         early.move(line);
 }
 
-/* An attribute that the incomplete stanza before this one has as well, or cannot have, is none of its missing lines. */
+/* An attribute that the incomplete stanza before this one already has, or cannot have, is not one of its missing lines.
+ * */
 void recovery::settle_split() {
     if (known.split.kind == NO_KIND || see.attr().dup_allowed != 0)
         return;
@@ -107,7 +108,7 @@ void recovery::recover_attribute(const fatal_exit &failure) {
     compiler.forget_overflow(); /* its mark would report the same number twice */
 }
 
-/* The stanza kind that a line is nearly the name of, although it begins with a blank. */
+/* The stanza kind whose name a line resembles, although it begins with a blank. */
 language::guess recovery::header_meant(const fatal_exit &failure) const {
     if (failure.id != MSG_NO_EQUALS && failure.id != MSG_NO_STANZA)
         return {};
@@ -139,7 +140,7 @@ std::string_view recovery::name_given() const {
     return line.at(see.name_place());
 }
 
-/* The attribute of the current line; null if its name is like none of the kind's. */
+/* The attribute of the current line; null if its name resembles no attribute of the kind. */
 const table_attrs *recovery::attr_meant() const {
     const srtable_ctrl &table = table_of(known.kind);
     std::string_view name = name_given();
@@ -173,7 +174,7 @@ bool recovery::follows(const fatal_exit &failure) {
     return is_misplaced(failure);
 }
 
-/* Whether a value may be refused only because its line belongs to a stanza of another kind. */
+/* True if a value may have been refused only because its line belongs to a stanza of another kind. */
 bool recovery::is_foreign_value(const fatal_exit &failure) const {
     return failure.id == MSG_INVALID_VALUE || failure.id == MSG_NO_VALID_VALUE || failure.id == MSG_ELEMENT_DEFAULT ||
            is_foreign_property(failure);
@@ -190,9 +191,9 @@ bool recovery::is_foreign_property(const fatal_exit &failure) const {
     return false;
 }
 
-/* Whether a line belongs to another stanza, as one before it did. The first such line is only noted: a second name, or
- * an attribute that other kinds have and this one has not. Before it there may be a line that makes the stanza suspect,
- * and has been reported: a required attribute that is repeated, or a property of another kind. */
+/* True if a line belongs to another stanza, as an earlier line did. The first such line is only noted: a second name,
+ * or an attribute that other kinds have and this one has not. An earlier line, which has been reported, may also make
+ * the stanza suspect: a repeated required attribute, or a property of another kind. */
 bool recovery::is_misplaced(const fatal_exit &failure) {
     stanza_record &stanza = known.stanza();
     bool unknown = failure.id == MSG_UNKNOWN_ATTRIBUTE && !type_meant();
@@ -237,7 +238,8 @@ bool recovery::is_other_index() const {
     return index >= 0 && (index == other_index || index == awaited_index);
 }
 
-/* After a wrong index the count either continues from it, or skips it. One that is not taken leaves the one before. */
+/* After a wrong index the count either continues from it, or skips it. An index that is not accepted leaves the
+ * previous one. */
 void recovery::recover_index(bool consequence) {
     int expected = compiler.expected_index();
     number given(see.value(), 10);
@@ -250,7 +252,8 @@ void recovery::recover_index(bool consequence) {
     index_lost = false;
 }
 
-/* A value was refused because its element has no known type. That has been reported: not at the run's end as well. */
+/* A value was refused because its element has no known type. That has been reported, so it is not reported again at the
+ * end of the run. */
 void recovery::report_type_here() {
     int type_line = known.stanza().data_type.at.line;
     size_t others = std::erase_if(known.run.odd_types, [&](const mention &odd) { return odd.at.line == type_line; });

@@ -1,4 +1,4 @@
-/* recover_end.cpp: the end of the source: completes what is open, and looks for what only the whole can lack. */
+/* recover_end.cpp: the end of the source: completes open stanzas, and reports what the source as a whole lacks. */
 
 #include "check/notes.h"
 #include "check/recovery.h"
@@ -30,7 +30,7 @@ void recovery::close_all() {
     warned.source_end(see);
 }
 
-/* Whether the step is to be tried again, without the record that it failed for. */
+/* True if the step must be tried again, without the record for which it failed. */
 bool recovery::recover_end(const fatal_exit &failure) {
     int failed = failed_kind(failure);
     bool reported = failed >= 0 && compiler.is_broken(failed);

@@ -24,7 +24,7 @@ bool wants_class(message_id id) {
            id == MSG_NO_CLASS_FOR_ACTION || id == MSG_NO_CLASS_FOR_SD;
 }
 
-/* Names and Ids have to differ within a class, and elements within their run. */
+/* Names and Ids must differ within a class, and those of elements within their run. */
 void forget_declarations(declarations &declared, int next_kind, bool begins_run, bool begins_class) {
     if (begins_run)
         declared.names[index_of(next_kind)].clear();
@@ -73,7 +73,8 @@ void recovery::take_header(const attr_text &text, bool guessed) {
     skip_stanza();
 }
 
-/* Whether the next index of the run is not known: the element before has been reported, and gave none. */
+/* True if the next index of the run is unknown, because the element before it gave no index, which has been reported.
+ * */
 bool recovery::loses_index(int next_kind) const {
     if (next_kind != known.run.kind || !compiler.run_is_open())
         return false;
@@ -109,7 +110,7 @@ void recovery::open_stanza(int kind, bool broken) {
         known.map_line = line.number;
 }
 
-/* Whether the header is to be tried again. */
+/* True if the header must be tried again. */
 bool recovery::recover_header(const fatal_exit &failure, int kind) {
     if (failure.record >= 0)
         return recover_completion(failure);
@@ -129,7 +130,7 @@ bool recovery::recover_header(const fatal_exit &failure, int kind) {
     return false;
 }
 
-/* The header completes a record, which failed. */
+/* The header completed a record, which failed. */
 bool recovery::recover_completion(const fatal_exit &failure) {
     int failed = failed_kind(failure);
     if (!compiler.is_broken(failed) && !is_reported_otherwise(failure) && !is_line_of_neighbour(failure, failed) &&
@@ -167,7 +168,8 @@ void recovery::give_up_map() {
     skip_stanza();
 }
 
-/* A header that names no kind: it is misspelt, an attribute line without its blank, or lost. */
+/* A header that names no kind: it is misspelt, or it is an attribute line without its leading blank, or a header is
+ * missing. */
 void recovery::unknown_header(const attr_text &text, const fatal_exit &failure) {
     std::string_view name(text.name, static_cast<size_t>(text.end - text.name));
     if (line.continues && error_line + 1 == line.number)
@@ -208,7 +210,7 @@ bool recovery::take_joined_header(std::string_view name, finding &error) {
     return true;
 }
 
-/* A header's name without what cannot be seen of it. */
+/* A header's name without its invisible characters. */
 std::string_view recovery::bare_header(finding &error, std::string_view name) {
     auto add = [&](std::string note, edit removal) {
         error.notes.push_back({line.all(), std::move(note)});

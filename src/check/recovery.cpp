@@ -1,4 +1,4 @@
-/* recovery.cpp: what the recovery does about headers, attribute lines and the end of the source alike. */
+/* recovery.cpp: the steps of the recovery that headers, attribute lines and the end of the source share. */
 
 #include "check/recovery.h"
 
@@ -25,9 +25,8 @@ finding &recovery::report(const fatal_exit &failure, const place &at) {
     return found.error(row, at, line.raw, text_of(failure));
 }
 
-/* Reports an error where its cause is, if that is known, and otherwise where the compiler met it. The compiler prints
- * the first error that it meets, so a cause in front of one that has been reported does not become the error's place.
- */
+/* Reports an error at its cause, if that is known, and otherwise where the compiler found it. The first error must be
+ * the one that the compiler prints, so an error is not moved to a cause before one that has been reported. */
 void recovery::report_with_notes(const fatal_exit &failure, const place &met, int kind) {
     std::optional<mention> cause = cause_of(failure, kind, see);
     bool moves = cause && cause->at.line > error_line;
@@ -39,12 +38,12 @@ void recovery::report_with_notes(const fatal_exit &failure, const place &met, in
     error.notes.push_back({met, stops_here(failure, see), met.column == 0 ? "" : std::string(line.raw)});
 }
 
-/* Whether an error may be a mistake of its own. One that no source causes is not, after others. */
+/* True if an error may be a separate mistake. An error that no source causes is not, if there were others before. */
 bool recovery::may_follow(const fatal_exit &failure) const {
     return found.errors() == 0 || message_of(failure.id).whose != blame::program;
 }
 
-/* Whether the stanza that an error misses has been reported: it is broken, or its header is lost. */
+/* True if the stanza that an error finds missing has been reported, because it is broken or its header is missing. */
 bool recovery::is_reported_otherwise(const fatal_exit &failure) const {
     bool map_broken = compiler.is_broken(SC_CLASS_TO_MANAGER_MAPPING);
     switch (failure.id) {
@@ -80,8 +79,8 @@ bool recovery::may_retract(warning_id id, int at_line) const {
     }
 }
 
-/* Whether a line of one stanza is in the next one, or the other way round, which has been reported for the first of the
- * two: one lacks what the other has twice. */
+/* True if a line of one stanza is in the next one, or the other way round, so that one lacks what the other has twice.
+ * This has then been reported for the first of the two. */
 bool recovery::is_line_of_neighbour(const fatal_exit &failure, int kind) {
     int ordinal = known.stanzas[index_of(kind)].ordinal;
     if (failure.id == MSG_REPEATED_ATTRIBUTE) {
@@ -136,7 +135,7 @@ void recovery::abandon(int kind, const fatal_exit &failure) {
         compiler.give_up_run();
 }
 
-/* What has been reported is not completed: its record is dropped before the compiler comes to it. */
+/* A stanza with a reported error is not completed: its record is dropped before the compiler reaches it. */
 void recovery::settle_broken(int next_kind) {
     if (compiler.run_is_open() && compiler.is_broken(known.run.kind))
         compiler.complete_element();
@@ -154,13 +153,13 @@ void recovery::skip_stanza() {
     known.kind = NO_KIND;
 }
 
-/* There is a stanza of one of these kinds without its header. */
+/* Notes that the header of a stanza of one of these kinds is missing. */
 void recovery::lose_header(const kind_set &kinds) {
     known.lost.kinds |= kinds;
     known.lost.owner = known.lost.owner || kinds.test(SC_CLASS_ACTION) || kinds.test(SC_RESOURCE_ACTION);
 }
 
-/* What the latest stanza of a kind lacks may be in lines that are not understood. */
+/* True if the missing attributes of the latest stanza of a kind may be in lines that were not understood. */
 void recovery::break_if_incomplete(int kind) {
     if (!compiler.is_complete(kind))
         compiler.set_broken(kind);
@@ -206,7 +205,7 @@ void recovery::note_value() {
         known.run.odd_types.push_back(given);
 }
 
-/* Text that is not a number is no Id: it has a warning of its own. */
+/* Text that is not a number does not count as an Id; there is another warning for it. */
 void recovery::declare() {
     std::string_view attr = see.attr().ta_name;
     int *line_of_first = nullptr;
@@ -228,7 +227,7 @@ void recovery::declare() {
         *line_of_first = line.number;
 }
 
-/* Takes a text instead of the current line's, of which an error has been reported. */
+/* Gives the compiler a text instead of the current line, of which an error has been reported. */
 void recovery::take_quietly(std::string_view text, size_t added) {
     try {
         compiler.take_attribute(line.replaced(text, added));

@@ -1,5 +1,5 @@
-/* recovery.h: continues after an error, so that each mistake is reported once. Up to the first error it does nothing
- * that the compiler would not do. */
+/* recovery.h: continues after an error, so that each mistake is reported once. Up to the first error it does exactly
+ * what the compiler does. */
 #ifndef CDGEN_CHECK_RECOVERY_H
 #define CDGEN_CHECK_RECOVERY_H
 
@@ -19,17 +19,17 @@ public:
     recovery(compilation &driven, current_line &current, knowledge &remembered, findings &results, const view &whole,
              const watchers &warnings_at_work);
 
-    /* Take the current line; what is wrong with it is reported. (recover_header.cpp, recover_attribute.cpp) */
+    /* Take the current line and report its errors. (recover_header.cpp, recover_attribute.cpp) */
     void take_header(const attr_text &text, bool guessed);
     void take_attribute();
 
     /* The end of the source. (recover_end.cpp) */
     void close_all();
 
-    /* Whether a warning of a line may be taken back by what follows. */
+    /* True if later lines may still withdraw a warning of a line. */
     bool may_retract(warning_id id, int at_line) const;
 
-    /* Carriage returns at the ends of lines are passed over. */
+    /* Carriage returns at the ends of lines are ignored. */
     bool strips_returns() const {
         return strip_returns;
     }

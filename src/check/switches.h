@@ -9,7 +9,7 @@
 
 namespace check {
 
-/* Turns warnings on or off that are called by name or code, or as "all". Unknown names have no effect. */
+/* Turns warnings on or off, which are given by name or code, or as "all". Unknown names have no effect. */
 void switch_warnings(warning_set &set, const std::vector<std::string> &names, bool on);
 
 } // namespace check

@@ -26,11 +26,12 @@ struct value_key {
     std::string text;        /* empty for numbers */
 };
 
-/* The key of a text that the compiler has accepted as a value of a type, or of an element of an array type. Nothing for
- * NaN, which is neither above nor below a value, for a Binary of which bytes are lost, and for types without texts. */
+/* The key of a text that the compiler has accepted as a value of a type, or of an element of an array type. No value
+ * for NaN, which is neither above nor below other values, for a Binary of which bytes are lost, and for types without
+ * texts. */
 std::optional<value_key> key_of(vx_data_type_t type, std::string_view text);
 
-/* The key of the value that a type has by itself: 0, or nothing at all. */
+/* The key of a type's default value: 0 or empty. */
 std::optional<value_key> default_key(vx_data_type_t type);
 
 /* Ranges that do not overlap; those that would are united. Each takes the line that it was given in. */

@@ -1,4 +1,4 @@
-/* value_notes.cpp: how a line that the compiler refuses has to be written. */
+/* value_notes.cpp: notes that say how to write a line that the compiler refuses. */
 
 #include "check/value_notes.h"
 

@@ -1,4 +1,4 @@
-/* value_notes.h: how a line that the compiler refuses has to be written. Pure functions of texts. */
+/* value_notes.h: notes that say how to write a line that the compiler refuses. Pure functions of texts. */
 #ifndef CDGEN_CHECK_VALUE_NOTES_H
 #define CDGEN_CHECK_VALUE_NOTES_H
 

@@ -1,4 +1,4 @@
-/* view.h: what warnings and notes see of a check: all of it, and they change nothing. */
+/* view.h: the read-only view of a check that warnings and notes have. */
 #ifndef CDGEN_CHECK_VIEW_H
 #define CDGEN_CHECK_VIEW_H
 
@@ -31,7 +31,7 @@ struct view {
     std::string_view value() const {
         return line.at(value_place());
     }
-    /* What comes after the value if that is a comment without a blank in front, which may be meant as text. */
+    /* The text after the value, if it is a comment without a blank before it, which may have been meant as text. */
     std::string_view comment_at_value() const {
         place value = value_place();
         std::string_view rest = line.raw.substr(std::min(value.column - 1 + value.length, line.raw.size()));

@@ -51,7 +51,7 @@ bool is_whole(const view &see, vx_data_type_t type) {
     return is_numeric(type) || see.comment_at_value().empty();
 }
 
-/* What a stanza allows: its valid values, or its Range. */
+/* The values that a stanza allows: its valid values, or its Range. */
 class allowed_values {
 public:
     void add(const view &see, vx_data_type_t type) {
@@ -70,7 +70,7 @@ public:
         line = 0;
         comparable = true;
     }
-    /* Whether something else is allowed, but not this. */
+    /* True if other values are allowed, but not this one. */
     bool excludes(const std::optional<value_key> &key) const {
         return line != 0 && comparable && key && !ranges.has(*key);
     }
@@ -145,7 +145,7 @@ private:
                         "choose another value, or allow this one");
     }
 
-    /* What must be given whenever a resource is defined needs no default. */
+    /* An attribute that must be given whenever a resource is defined needs no default. */
     void look_at_implied(const view &see) {
         const stanza_record &stanza = see.known.stanza();
         vx_data_type_t type = see.compiler.data_type();
@@ -179,7 +179,7 @@ private:
     kept_lines defaults;
     bool touched = false; /* the stanza has any of these attributes */
     bool has_default = false;
-    bool is_required = false; /* whoever defines a resource must give it */
+    bool is_required = false; /* clients that define a resource must give it */
 };
 
 } // namespace

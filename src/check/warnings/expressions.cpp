@@ -1,5 +1,5 @@
-/* expressions.cpp: a warning about expressions that cannot be complete. Their grammar is the runtime's; that
- * parentheses and quotes come in pairs is all that is asked of them. */
+/* expressions.cpp: a warning about incomplete expressions. The runtime defines their grammar; this only checks that
+ * parentheses and quotes come in pairs. */
 
 #include "check/warnings/watcher.h"
 
@@ -13,7 +13,7 @@ namespace check {
 
 namespace {
 
-/* What has no partner, and where. */
+/* A character without a partner, and its place. */
 struct lone_character {
     size_t at;
     char character;

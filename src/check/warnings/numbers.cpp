@@ -1,4 +1,4 @@
-/* numbers.cpp: warnings about numbers that are stored otherwise than they are written. */
+/* numbers.cpp: warnings about numbers whose stored value differs from the written one. */
 
 #include "check/numbers.h"
 
@@ -43,7 +43,7 @@ public:
     }
 };
 
-/* The Ids of attributes, as far as they do not fit the class's Locator, which is looked up at the end. */
+/* The Ids of attributes that do not fit the class's Locator, which is looked up at the end. */
 class wide_ids {
 public:
     struct entry {

@@ -1,4 +1,4 @@
-/* partners.cpp: warnings about attributes of a stanza that need, bound or exclude another one. */
+/* partners.cpp: warnings about attributes of a stanza that need, limit or exclude another one. */
 
 #include "check/numbers.h"
 #include "check/warnings/watcher.h"
@@ -19,8 +19,8 @@ vx_uint16_t number_in(const view &see) {
     return static_cast<vx_uint16_t>(number(see.value(), 0).value);
 }
 
-/* What needs an Expression, or a ReArmDescription, which needs a ReArmExpression. A refused line may be the other one.
- */
+/* A line that needs an Expression, or a ReArmDescription, which needs a ReArmExpression. A refused line may be the
+ * missing one. */
 class no_expression : public watcher {
 public:
     using watcher::watcher;
@@ -101,7 +101,7 @@ private:
         int line;
     };
 
-    /* A group without a name has the one that another attribute gives it. */
+    /* An attribute without a GroupName uses the name that another attribute gives the group. */
     void look_at_name() {
         if (*group_name == 0)
             return;

@@ -17,8 +17,8 @@ size_t next_quote(std::string_view text, size_t from) {
     return quote;
 }
 
-/* The first quote that does not make a pair with another: the first of a pair follows a blank or an operator, and one
- * of these, or nothing, follows the second. */
+/* The first quote without a partner. In a pair, the first quote follows a blank or an operator, and the second is
+ * followed by one of these or by nothing. */
 size_t unpaired_quote(std::string_view text) {
     constexpr std::string_view APART = " \t()[]{}=!<>~&|+-*/,;:";
     for (size_t first = next_quote(text, 0); first != std::string_view::npos;) {
@@ -33,7 +33,7 @@ size_t unpaired_quote(std::string_view text) {
     return std::string_view::npos;
 }
 
-/* Values such as "user == "root"" are stored as they are meant: without the outer quotes. */
+/* Values such as "user == "root"" are stored as intended, without the outer quotes. */
 class text_after_quote : public watcher {
 public:
     using watcher::watcher;

@@ -57,7 +57,7 @@ private:
         place at;
         std::string source; /* the line */
     };
-    /* Another attribute, which was completed while the mark was that of a range. */
+    /* Another attribute, which was completed while the mark was set. */
     struct completed {
         int kind;
         place begin;

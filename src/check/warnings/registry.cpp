@@ -1,5 +1,6 @@
-/* registry.cpp: the table of warnings: what is said about each, and what makes it. docs/messages.md is checked against
- * it. The rows are in the order in which the warnings are given an event, which is that of findings in one line. */
+/* registry.cpp: the table of warnings: the texts about each, and the function that makes it. docs/messages.md is
+ * checked against it. The order of the rows is the order in which warnings are notified of an event, and so the order
+ * of findings in one line. */
 
 #include "check/warnings/registry.h"
 

@@ -1,4 +1,4 @@
-/* registry.h: all warnings at work. */
+/* registry.h: all warnings during a check. */
 #ifndef CDGEN_CHECK_WARNINGS_REGISTRY_H
 #define CDGEN_CHECK_WARNINGS_REGISTRY_H
 
@@ -10,7 +10,7 @@
 
 namespace check {
 
-/* The wanted warnings, which are given each event in turn. */
+/* The wanted warnings, which are notified of each event in turn. */
 class watchers {
 public:
     watchers(const warning_set &wanted, findings &found);

@@ -1,4 +1,4 @@
-/* repeats.cpp: warnings about what a class or a stanza gives not at all, or twice. */
+/* repeats.cpp: warnings about lines that a class or a stanza lacks or has twice. */
 
 #include "check/warnings/watcher.h"
 #include "format/data_types.h"

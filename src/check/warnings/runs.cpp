@@ -28,7 +28,7 @@ public:
         has_run = false;
     }
 
-    /* Whether the attribute's run ends before the next stanza, or does not come. Once for each attribute. */
+    /* True if the attribute's run ends before the next stanza, or is missing. True only once for each attribute. */
     bool is_settled(int next_kind) {
         bool run = is_attribute_run(next_kind);
         has_run = has_run || run;
@@ -84,7 +84,7 @@ private:
     sd_attribute latest;
 };
 
-/* A run that does not belong to what it follows. */
+/* Warns of a run that does not belong to the stanza before it. */
 class stray_run : public watcher {
 public:
     using watcher::watcher;

@@ -38,7 +38,8 @@ public:
     }
 };
 
-/* Where the output is known: a class that is called after it. If that is no name, the compiler says so. */
+/* If the output is known: a class that is named after it. If the output gives no valid name, the compiler reports it.
+ * */
 class no_name : public watcher {
 public:
     using watcher::watcher;

@@ -1,4 +1,4 @@
-/* texts.cpp: warnings about texts of which only a part is stored, or which are read otherwise than they look. */
+/* texts.cpp: warnings about texts that are stored only in part, or not as they look. */
 
 #include "check/warnings/watcher.h"
 #include "format/data_types.h"
@@ -166,8 +166,8 @@ private:
     }
 };
 
-/* Names are compared with their blanks. Of other texts only a blank that comes by itself is strange: blanks are part of
- * what is quoted. */
+/* Names are compared with their blanks. In other texts a leading blank is reported only without quotes, because in
+ * quotes it is intended. */
 class outer_blank : public watcher {
 public:
     using watcher::watcher;

@@ -1,5 +1,5 @@
-/* unknown.cpp: warnings about names that nothing in the source has, or uses. They are reported at the end, unless a
- * line or a stanza that was not understood may have, or use, the name. */
+/* unknown.cpp: warnings about names that the source does not define or does not use. They are reported at the end,
+ * unless a line or a stanza that was not understood may have, or use, the name. */
 
 #include "check/first_lines.h"
 #include "check/warnings/watcher.h"
@@ -29,7 +29,7 @@ std::string cure(std::string suggestion) {
     return suggestion.empty() ? "define it, or correct the name" : std::move(suggestion);
 }
 
-/* What the names of the source itself were meant to be is never certain. */
+/* Corrections of names that the source itself defines are never certain. */
 correction likely(const view &see, const mention &given, const language::name_list &names) {
     correction fix = see.line.renamed(given.at, given.source, language::meant_by(given.text, names));
     fix.sure = certainty::likely;
@@ -67,7 +67,7 @@ private:
     bool name_lost = false;
 };
 
-/* Reports each name once, where it is given first. */
+/* Reports each name once, at its first use. */
 class unknown_variable_class : public watcher {
 public:
     using watcher::watcher;

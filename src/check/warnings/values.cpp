@@ -1,4 +1,4 @@
-/* values.cpp: warnings about single values that mean less than they say. */
+/* values.cpp: warnings about single values that have less effect than it seems. */
 
 #include "check/warnings/watcher.h"
 #include "format/data_types.h"
@@ -43,7 +43,7 @@ public:
     }
 };
 
-/* Where the element's default will be asked for, the compiler may refuse the type at the run's end. */
+/* If the element needs a default, the compiler may refuse its type at the end of the run. */
 class element_type : public watcher {
 public:
     using watcher::watcher;
@@ -114,7 +114,8 @@ private:
                 return advise(report(see, at, language::quoted(name) + " contradicts " + language::quoted(other)),
                               "remove one of the two");
     }
-    /* Whether a definition must, may or must not give the attribute. What it must give cannot be only read. */
+    /* Whether a client must, may or must not give the attribute when it defines a resource. An attribute that must be
+     * given cannot be read-only. */
     static bool contradict(std::string_view one, std::string_view other) {
         constexpr std::string_view PAIRS[][2] = {{"ReqdForDefine", "OptForDefine"},
                                                  {"ReqdForDefine", "InvalForDefine"},

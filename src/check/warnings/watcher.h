@@ -1,4 +1,4 @@
-/* watcher.h: a warning at work: it watches a check and reports what it finds. It knows no other warning. */
+/* watcher.h: a warning during a check: it watches the check and reports findings. It knows no other warning. */
 #ifndef CDGEN_CHECK_WARNINGS_WATCHER_H
 #define CDGEN_CHECK_WARNINGS_WATCHER_H
 
@@ -38,13 +38,13 @@ public:
     virtual void carriage_return(const view &, size_t /* at */) {}
     /* The compiler has accepted an attribute line whose value is in quotes. */
     virtual void quoted_value(const view &) {}
-    /* It has accepted an attribute line, and the attribute surely belongs to the current stanza: first for each
-     * number in the value that is not plain, */
+    /* It has accepted an attribute line, and the attribute certainly belongs to the current stanza. Called first for
+     * each number in the value that is not plain, */
     virtual void number(const view &, const number_part &) {}
-    /* then for the whole. Only for the attribute types that the class lists as `types`. */
+    /* then for the whole value. Only for the attribute types that the class lists as `types`. */
     virtual void value(const view &) {}
-    /* The current stanza, if there is one, ends; the next one's kind is NO_KIND at the end of the source or if it is
-     * not known. */
+    /* The current stanza, if any, ends. The kind of the next one is NO_KIND at the end of the source or if it is
+     * unknown. */
     virtual void stanza_end(const view &, int /* next_kind */) {}
     /* The compiler is about to take a header, or at the end of the source (NO_KIND) another closing step; */
     virtual void before_step(const view &, int /* next_kind */) {}

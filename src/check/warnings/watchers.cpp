@@ -1,4 +1,4 @@
-/* watchers.cpp: gives each event to the warnings that have an interest in it. */
+/* watchers.cpp: notifies warnings of the events that they need. */
 
 #include "check/warnings/registry.h"
 
@@ -27,7 +27,7 @@ void watchers::attribute(const view &see) const {
         for (watcher *each : of_event[ON_QUOTED_VALUE])
             each->quoted_value(see);
     if (see.known.stanza().misplaced &&
-        see.attr().ta_type != AT_SD_DATA_TYPE) /* whose ever the type is, it is unknown */
+        see.attr().ta_type != AT_SD_DATA_TYPE) /* whichever attribute or element it belongs to, its type is unknown */
         return;
     if (!of_event[ON_NUMBER].empty())
         odd_numbers(see);

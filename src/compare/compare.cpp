@@ -11,19 +11,19 @@ namespace compare {
 
 namespace {
 
-/* A section's revision is in its anchor, but belongs to what the section holds. */
+/* A section's revision is in its anchor, but belongs to the content of the section. */
 const cdb::field_fact &revision_fact() {
     return cdb::format_for<cdb_dsect_anchor_t>.fact_at(offsetof(cdb_dsect_anchor_t, cda_revision));
 }
 
-/* What an attribute or action keeps when it is renamed. */
+/* The properties that an attribute or action keeps when it is renamed. */
 using number_and_type = std::tuple<std::uint32_t, vx_data_type_t>;
 
 number_and_type number_and_type_of(const node &n) {
     return {number_in(n, *number_field_of(n)), data_type_of(n)};
 }
 
-/* Numbers that are not equal may read alike. */
+/* Unequal numbers may still be shown alike. */
 bool numbers_read_alike(std::uint32_t a, std::uint32_t b, cdb::meaning as) {
     return a == b || text_of_number(a, as) == text_of_number(b, as);
 }
@@ -68,7 +68,7 @@ private:
         report({.what = change::CHANGED, .path = path, .before = &was, .after = &is, .broken = broken});
     }
 
-    /* Both are of one kind, and so have the same fields. */
+    /* Both have the same kind, and therefore the same fields. */
     void compare_facts(const node &older, const node &newer) {
         if (older.kind == node_kind::element && older.index != newer.index)
             compare_fact(older, newer, {&ELEMENT_INDEX, static_cast<std::uint32_t>(older.index)},
@@ -167,8 +167,8 @@ private:
         return pairs.left();
     }
 
-    /* Pairs those without a partner that have one number and type; returns the older ones' positions, in their order.
-     */
+    /* Pairs the parts without a partner that have the same number and type; returns the positions of the older ones, in
+     * their order. */
     static std::vector<std::uint32_t> find_renamed(const family &were, const family &are, pairing &pairs) {
         std::vector<std::uint32_t> renamed;
         if (number_field_of(were.first) == nullptr || pairs.left().empty())

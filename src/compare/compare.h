@@ -1,5 +1,5 @@
-/* compare.h: how two databases differ in meaning: nothing of where records are in the file, of its byte order, or of
- * when it was made; and for whom a difference matters. */
+/* compare.h: how two databases differ in meaning, and for whom a difference matters. The places of records in the file,
+ * its byte order, and the time when it was made are ignored. */
 #ifndef CDGEN_COMPARE_COMPARE_H
 #define CDGEN_COMPARE_COMPARE_H
 
@@ -12,15 +12,15 @@ namespace compare {
 enum class change : std::uint8_t {
     REMOVED,
     ADDED,
-    RENAMED, /* an attribute or action has its number and type, but another name */
+    RENAMED, /* an attribute or action has kept its number and type, but has another name */
     CHANGED
 };
 
-/* It refers to what the comparison has in hand: take what is needed of it at once. */
+/* A difference refers to temporary data of the comparison, so copy what is needed of it. */
 struct difference {
     change what;
-    std::span<const node *const> path; /* from the database to the node that differs, as it is named now; a node that is
-                                          gone, or renamed, as it was named before */
+    std::span<const node *const> path; /* from the database to the node that differs, with the names in the newer
+                                        * database; for a removed or renamed node, with the name in the older one */
     const node *renamed_to = nullptr;  /* RENAMED only */
     const fact *before = nullptr;      /* CHANGED only */
     const fact *after = nullptr;       /* CHANGED only */
@@ -29,9 +29,9 @@ struct difference {
 
 using taker = std::function<void(const difference &)>;
 
-/* Hands over each difference when it is found, in the order of the older database. Of each record, new parts come after
- * those that were there before. Takes time in proportion to the databases, and memory only where parts have changed
- * places. What the taker throws ends it. */
+/* Passes on each difference when it is found, in the order of the older database. The new parts of a record come after
+ * the others. Takes time proportional to the size of the databases, and memory only where parts have moved. An
+ * exception of the receiver ends the comparison. */
 void compare(const origin &before, const origin &after, const taker &take);
 
 } // namespace compare

@@ -1,4 +1,4 @@
-/* fields.cpp: how the numbers in fields read. */
+/* fields.cpp: the numbers in fields as texts. */
 
 #include "compare/fields.h"
 
@@ -47,7 +47,7 @@ std::string text_of_number(std::uint32_t number, cdb::meaning as) {
     case cdb::meaning::NONE_IS_65535:
     case cdb::meaning::LOCATOR:
         return number == cdb::none_of(as) ? "none" : std::to_string(number);
-    case cdb::meaning::UNUSED: /* none and 0 lead nowhere alike */
+    case cdb::meaning::UNUSED: /* "none" and 0 both lead nowhere */
         return number == CDB_NONE ? "0" : std::to_string(number);
     default:
         return std::to_string(number);

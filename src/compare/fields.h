@@ -1,4 +1,4 @@
-/* fields.h: how the numbers in fields read, for the tree of meanings. */
+/* fields.h: the numbers in fields as texts, for comparisons. */
 #ifndef CDGEN_COMPARE_FIELDS_H
 #define CDGEN_COMPARE_FIELDS_H
 
@@ -11,7 +11,7 @@ namespace compare {
 /* Names joined with "+"; bits without a name in hexadecimal; "none". */
 std::string text_of_bits(std::uint32_t bits, std::span<const props_t> known);
 
-/* The number of a field that means this. The database is sound. */
+/* The text for the number of a field with this meaning. The database must be sound. */
 std::string text_of_number(std::uint32_t number, cdb::meaning as);
 
 } // namespace compare

@@ -1,4 +1,4 @@
-/* identity.cpp: what records and entries are found by. */
+/* identity.cpp: what identifies records and entries. */
 
 #include "compare/identity.h"
 
@@ -26,7 +26,7 @@ std::size_t hash_of(const identity &i) {
     return sum * FACTOR + static_cast<std::size_t>(i.kind);
 }
 
-/* Of a valid value no elements are followed. */
+/* The elements of a valid value are not followed. */
 owned_value valid_value_in(const node &n, std::size_t cell) {
     const cdb::bytes &strings = n.section->tables.strings;
     return {{n.area, n.at + cell, n.type, strings, cdb::NESTING_MAX},

@@ -1,4 +1,4 @@
-/* identity.h: what records and entries are found by. */
+/* identity.h: what identifies records and entries. */
 #ifndef CDGEN_COMPARE_IDENTITY_H
 #define CDGEN_COMPARE_IDENTITY_H
 
@@ -6,7 +6,7 @@
 
 namespace compare {
 
-/* What parts of one family pair by: their kind, and a name, numbers or values. */
+/* The key by which parts of one family are paired: their kind, and a name, numbers or values. */
 struct identity {
     node_kind kind;
     std::uint64_t number = 0;   /* of an entry that has no name */
@@ -17,7 +17,7 @@ struct identity {
 
 identity identity_of(const node &n);
 
-/* An order in which parts that pair are equal. */
+/* An order in which parts with the same key are equal. */
 std::strong_ordering order_of(const identity &a, const identity &b);
 
 std::size_t hash_of(const identity &i);

@@ -9,7 +9,7 @@ namespace compare {
 
 namespace {
 
-/* Parts of stored values, unlike actions. */
+/* Kinds whose values are stored, unlike actions. */
 bool is_attribute(node_kind kind) {
     return kind >= node_kind::persistent_class_attribute && kind <= node_kind::dynamic_attribute;
 }
@@ -66,7 +66,7 @@ range_set ranges_of(const family &entries) {
 
 /* ---- Bounds ---------------------------------------------------------------------------------------------------- */
 
-/* The number of a bound; of an array, that of its only element. Nothing if there is none. */
+/* The number of a bound, or of the only element if it is an array. No value if there is no number. */
 std::optional<ordinal> ordinal_of_bound(const node &attribute, std::size_t offset) {
     const cdb::bytes &strings = attribute.section->tables.strings;
     owned_value bound =
@@ -97,8 +97,8 @@ bool is_narrower(const node &before, const node &after, const fact &changed) {
 
 /* ---- Properties ------------------------------------------------------------------------------------------------ */
 
-/* What a persistent attribute says of resources that are being defined is judged as a whole, and less is asked of
- * clients if ReadOnly is gone. */
+/* The properties of a persistent attribute that matter for defining resources are judged together; removing ReadOnly
+ * demands less of clients. */
 void judge_persistent_properties(std::uint32_t was, std::uint32_t is, breaches &found) {
     constexpr std::uint32_t READ_ONLY_BIT = 0x1;
     constexpr std::uint32_t OF_DEFINING = REQD_FOR_DEFINE | OPT_FOR_DEFINE | INVAL_FOR_DEFINE;
@@ -219,7 +219,7 @@ breaches family_judge::added(const node &part) const {
     return found;
 }
 
-/* Whoever looks for the old name misses it. */
+/* Programs that look for the old name do not find it. */
 breaches family_judge::renamed(const node &after) const {
     breaches found;
     found.add(breach::GONE);

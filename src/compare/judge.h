@@ -29,14 +29,14 @@ private:
 /* The attributes and actions of a class, by number. */
 class numbered_parts {
 public:
-    /* of: the families of the class. They are looked through when a number is asked for. */
+    /* of: the families of the class. They are searched when a number is looked up. */
     explicit numbered_parts(const families &of) : parts(of) {}
 
-    /* Whether a part of this kind has the number. */
+    /* True if a part of this kind has the number. */
     bool has(node_kind kind, std::uint32_t number);
 
-    /* Adds why values that were stored under an attribute's number are not its own. after: the attribute as it is now,
-     * which had another number, name or type, or is new. */
+    /* Adds the rules that are broken because the values stored under an attribute's number belong to another attribute.
+     * after: the attribute in the newer database, which is new or had another number, name or type. */
     void judge_stored(const node &after, breaches &found);
 
 private:
@@ -77,10 +77,10 @@ private:
     std::optional<range_set> covered; /* by the entries after; made when it is needed */
 };
 
-/* Judges a field that reads differently. numbers: as above. */
+/* Judges a field whose text differs. numbers: as above. */
 breaches judge_change(const node &before, const node &after, const fact &was, const fact &is, numbered_parts *numbers);
 
-/* Whether a difference is that the class has a lower version. */
+/* True if the difference is that the class has a lower version. */
 bool is_lower_version(const fact &was, const fact &is);
 
 } // namespace compare

@@ -39,7 +39,7 @@ enum class node_kind : std::uint8_t {
 
 struct kind_row {
     node_kind kind;
-    std::string_view text; /* as reports call it; empty: the field that leads to it says it */
+    std::string_view text; /* its name in reports; empty: the name depends on the field that leads to it */
     bool is_looked_for;    /* true: readers look for one by its name or number */
 };
 

@@ -1,4 +1,4 @@
-/* node.cpp: the records of a database and the entries of its lists, as comparisons meet them. */
+/* node.cpp: the records of a database and the entries of its lists, as nodes for comparisons. */
 
 #include "compare/node.h"
 
@@ -9,7 +9,7 @@ namespace compare {
 
 namespace {
 
-/* The lists that fields of a record lead to, and the tables behind it. */
+/* The lists that fields of a record lead to, and the tables that follow it. */
 class family_finder {
 public:
     family_finder(const node &of, families &found) : n(of), to(found) {}
@@ -36,7 +36,7 @@ private:
         return {.kind = kind, .from = n.from, .format = format, .area = area, .at = at, .section = n.section};
     }
 
-    /* Entries begin after the list's head. A list that is not the record's own has no entries here. */
+    /* Entries begin after the list's header. A list that belongs to another record counts as empty here. */
     void add_entries(const node &first, const cdb::field &f) {
         std::uint32_t place = number_in(n, f);
         bool has_list =
@@ -156,7 +156,7 @@ node section_node(const origin &from, std::size_t index, section_tables &room) {
 
 /* ---- Facts ----------------------------------------------------------------------------------------------------- */
 
-/* A field that a reversal leaves is read as it is stored. */
+/* A field that is not reversed is read as it is stored. */
 std::uint32_t number_in(const node &n, const cdb::field &f) {
     cdb::bytes area = f.stays ? cdb::bytes(n.area.raw(), std::endian::native) : n.area;
     bool is_short = f.width == sizeof(std::uint16_t);

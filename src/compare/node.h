@@ -1,5 +1,5 @@
-/* node.h: the records of a database and the entries of its lists, as comparisons meet them. They are made when they are
- * asked for; only their places are kept. */
+/* node.h: the records of a database and the entries of its lists, as nodes for comparisons. Nodes are made when they
+ * are needed; only their places are kept. */
 #ifndef CDGEN_COMPARE_NODE_H
 #define CDGEN_COMPARE_NODE_H
 
@@ -20,14 +20,15 @@ struct origin {
 /* A section, as far as its records need it. */
 struct section_tables {
     cdb::class_tables tables = {};
-    std::string_view first_text = {}; /* the text at 0. Any number of references may lead to it, so it is found once */
+    std::string_view first_text = {}; /* the text at 0; it is read only once, because any number of references may lead
+                                       * to it */
 };
 
 /* A record, or an entry of a list. */
 struct node {
     node_kind kind;
     const origin *from = nullptr;
-    const cdb::record_format *format = nullptr; /* of its record; null: it has no facts but those of an anchor */
+    const cdb::record_format *format = nullptr; /* of its record; null: it has no facts except those of an anchor */
     cdb::bytes area{};                          /* that the record is in */
     std::size_t at = 0;                         /* where */
     std::size_t index = 0;                      /* of an element in its structure; of a section among the anchors */
@@ -35,7 +36,7 @@ struct node {
     const cdb::field_fact *field = nullptr;     /* of an element: leads to its structure; null for any other kind */
     const section_tables *section = nullptr;    /* null: the whole database, or one of its sections */
 
-    /* What a report calls its kind: "PersistentResourceAttribute", "valid value", "input element". */
+    /* The name of its kind in reports: "PersistentResourceAttribute", "valid value", "input element". */
     std::string_view label() const {
         return field != nullptr ? field->label() : row_of(kind).text;
     }
@@ -44,9 +45,9 @@ struct node {
 /* The place of an element in its structure, which no field holds. */
 inline constexpr cdb::field_fact ELEMENT_INDEX = {.field = "ElementIndex", .words = "index"};
 
-/* What a record says in one field. */
+/* The content of one field of a record. */
 struct fact {
-    const cdb::field_fact *what; /* outlives the fact */
+    const cdb::field_fact *what; /* must outlive the fact */
     std::variant<std::uint32_t, std::string_view, owned_value> is;
 };
 
@@ -59,16 +60,16 @@ node section_node(const origin &from, std::size_t index, section_tables &room);
 
 /* ---- Facts ----------------------------------------------------------------------------------------------------- */
 
-/* The number that a field of the record says, or a part of a reference that is a number. */
+/* The number in a field of the record, or in a part of a reference that is a number. */
 std::uint32_t number_in(const node &n, const cdb::field &f);
 
-/* The text that a reference of the record leads to; empty for none. */
+/* The text that a reference of the record leads to; empty if it leads to nothing. */
 std::string_view text_in(const node &n, const cdb::field &f);
 
 /* The data type that the record names for its values; VX_UNKNOWN if it names none. */
 vx_data_type_t data_type_of(const node &n);
 
-/* What the record says in the field at a position in its format; nothing if that is no content, or if the field leads
+/* The content of the field at a position in the record's format. No value if the field is not content, or if it leads
  * to parts. */
 std::optional<fact> fact_in(const node &n, std::size_t field_index);
 
@@ -83,7 +84,7 @@ struct family {
     node at(std::size_t index) const;
 };
 
-/* At most so many families belong to one record: a class has inputs and tables. */
+/* The most families of one record: a class has inputs and tables. */
 inline constexpr std::size_t FAMILIES_MAX = 16;
 
 struct families {
@@ -98,13 +99,13 @@ struct families {
     }
 };
 
-/* Whether nodes of this kind can have parts. */
+/* True if nodes of this kind can have parts. */
 constexpr bool may_have_parts(node_kind kind) {
     return kind < node_kind::variety || kind == node_kind::element;
 }
 
-/* The parts of a record, not of a database. Two nodes of one kind have families of the same kinds in the same order,
- * some of which may be empty. */
+/* The parts of a record (not of a database). Two nodes of the same kind have families of the same kinds in the same
+ * order, some of which may be empty. */
 void add_families(const node &n, families &to);
 
 } // namespace compare

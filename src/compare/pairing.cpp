@@ -1,4 +1,4 @@
-/* pairing.cpp: which parts of one record are which parts of another. */
+/* pairing.cpp: pairs the parts of one record with those of another. */
 
 #include "compare/pairing.h"
 
@@ -9,7 +9,7 @@ namespace compare {
 
 namespace {
 
-/* One of the two sides. Their members are made again whenever they are asked for: only hashes are kept. */
+/* One of the two sides. Only hashes are kept, and members are made again whenever they are needed. */
 class side {
 public:
     side(const siblings &members, std::size_t first) : all(members) {
@@ -39,7 +39,7 @@ private:
         std::uint32_t index;
     };
 
-    /* By hash, those of one hash by identity, and those of one identity by position. */
+    /* Sorts by hash, then by identity, then by position. */
     void sort() {
         std::sort(entries.begin(), entries.end(), [this](const hashed &a, const hashed &b) {
             if (a.hash != b.hash || a.index == b.index)

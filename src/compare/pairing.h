@@ -1,4 +1,4 @@
-/* pairing.h: which parts of one record are which parts of another. */
+/* pairing.h: pairs the parts of one record with those of another. */
 #ifndef CDGEN_COMPARE_PAIRING_H
 #define CDGEN_COMPARE_PAIRING_H
 
@@ -29,18 +29,18 @@ private:
     std::size_t count;
 };
 
-/* Parts of one identity pair in their order, the first with the first. */
+/* Parts with the same identity are paired in their order, the first with the first. */
 class pairing {
 public:
     static constexpr std::uint32_t NONE = 0xFFFFFFFF;
 
     pairing(const siblings &before, const siblings &after);
 
-    /* The position among those after of the partner of one before; NONE if it has none. */
+    /* The position in `after` of the partner of a part in `before`; NONE if it has no partner. */
     std::uint32_t partner_of(std::size_t before) const {
         return before < alike ? static_cast<std::uint32_t>(before) : partners[before - alike];
     }
-    /* The positions of those after that have no partner, in their order. */
+    /* The positions of the parts in `after` without a partner, in their order. */
     const std::vector<std::uint32_t> &left() const {
         return unpaired;
     }
@@ -53,7 +53,7 @@ public:
     void join(std::span<const pair> pairs);
 
 private:
-    std::size_t alike = 0;               /* so many of both sides, from the first on, are pairs */
+    std::size_t alike = 0;               /* how many parts at the beginning of both sides are pairs */
     std::vector<std::uint32_t> partners; /* of the others before */
     std::vector<std::uint32_t> unpaired;
 };

@@ -1,4 +1,4 @@
-/* ranges.cpp: sets of numbers that are given as ranges. */
+/* ranges.cpp: sets of numbers, given as ranges. */
 
 #include "compare/ranges.h"
 

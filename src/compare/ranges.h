@@ -1,4 +1,4 @@
-/* ranges.h: sets of numbers that are given as ranges. */
+/* ranges.h: sets of numbers, given as ranges. */
 #ifndef CDGEN_COMPARE_RANGES_H
 #define CDGEN_COMPARE_RANGES_H
 
@@ -11,7 +11,7 @@ namespace compare {
 /* Numbers of one type in the order of their values. */
 using ordinal = std::uint64_t;
 
-/* Nothing for a value that is not a number in its cell, and for a NaN. */
+/* No value if the cell does not hold a number, and for a NaN. */
 std::optional<ordinal> ordinal_of(const cdb::value &value);
 
 struct range {
@@ -19,13 +19,13 @@ struct range {
     ordinal high;
 };
 
-/* The numbers that are in any of some ranges. */
+/* The union of several ranges of numbers. */
 class range_set {
 public:
-    /* Whole numbers have no others between them, so that 1 to 4 and 5 to 9 are 1 to 9. */
+    /* Adjacent ranges of whole numbers are joined: 1 to 4 and 5 to 9 are 1 to 9. */
     range_set(std::vector<range> ranges, bool are_whole_numbers);
 
-    /* Whether it has all numbers of a range. */
+    /* True if it contains all numbers of a range. */
     bool has(const range &r) const;
 
 private:

@@ -1,4 +1,4 @@
-/* rules.cpp: what must not differ, and for whom. */
+/* rules.cpp: the rules of compatibility. */
 
 #include "compare/rules.h"
 

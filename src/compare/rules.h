@@ -1,4 +1,4 @@
-/* rules.h: what must not differ, and for whom. */
+/* rules.h: the rules of compatibility: which differences break what. */
 #ifndef CDGEN_COMPARE_RULES_H
 #define CDGEN_COMPARE_RULES_H
 
@@ -8,8 +8,8 @@
 
 namespace compare {
 
-/* Who relies on a class. Whoever comes later in the list needs all that those before need: clients read, and what is
- * stored is read by clients. So each level includes the ones before it. */
+/* What relies on a class. Clients also read, and stored values are read by clients, so each level includes the ones
+ * before it. */
 enum class level : std::uint8_t {
     READERS, /* programs that look things up in the database */
     CLIENTS, /* programs that define resources, give values and start actions */

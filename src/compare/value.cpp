@@ -11,7 +11,7 @@ namespace compare {
 
 namespace {
 
-/* Whether an out-of-line value of its type is stored at its offset. */
+/* True if an out-of-line value of the type is stored at the offset. */
 bool is_stored(const cdb::value &value, std::size_t place, const cdb::bytes &strings) {
     constexpr std::size_t ALIGNMENT = 8;
     std::size_t count = strings.number<std::uint32_t>(place);
@@ -60,8 +60,8 @@ bool is_number(vx_data_type_t type) {
     return type >= VX_INT32 && type <= VX_FLOAT64;
 }
 
-/* Of two numbers of one type: whether their bits are the same. If not, they may read alike all the same: of a NaN, not
- * every bit is shown. */
+/* True if two numbers of one type have the same bits. Others may still be shown alike, because not every bit of a NaN
+ * is shown. */
 bool have_same_bits(const cdb::value &a, const cdb::value &b) {
     return a.integer() == b.integer() && a.natural() == b.natural() &&
            std::bit_cast<std::uint64_t>(a.real()) == std::bit_cast<std::uint64_t>(b.real());

@@ -1,4 +1,4 @@
-/* value.h: values as they are compared: what is seen of one, and whether two would read alike. */
+/* value.h: values as they are compared. Two values are equal if they would be shown alike. */
 #ifndef CDGEN_COMPARE_VALUE_H
 #define CDGEN_COMPARE_VALUE_H
 
@@ -13,7 +13,7 @@ namespace compare {
 /* A value, and what is needed to follow it. */
 struct owned_value {
     cdb::value value;
-    bool is_own = true;   /* the value is its record's own; if not, it is not followed */
+    bool is_own = true;   /* true: the value belongs to its record; false: it is not followed */
     cdb::bytes strings{}; /* of its class */
     const cdb::ownership *owners = nullptr;
 };
@@ -40,14 +40,14 @@ private:
     std::size_t size = 0;
 };
 
-/* What is seen of a value. Two values whose looks are equal read alike, whatever their types. */
+/* How a value looks when it is shown. Two values with equal looks are shown alike, whatever their types. */
 struct look {
     shape is = shape::NOTHING;
     digits number = {};          /* of a number, a handle, and a misplaced value its offset */
     std::string_view bytes = {}; /* of a text or a binary */
     std::size_t count = 0;       /* of elements, which are not part of it */
 
-    /* What distinguishes it from others of its shape, elements apart. */
+    /* What distinguishes it from others of its shape, apart from its elements. */
     std::string_view content() const {
         return is == shape::TEXT || is == shape::BINARY ? bytes : number.text();
     }
@@ -58,10 +58,10 @@ look look_at(const owned_value &v);
 /* An element of an array or a structure. */
 owned_value element_of(const owned_value &v, std::size_t index);
 
-/* Whether two values read alike. Takes time in proportion to the smaller one. */
+/* True if two values would be shown alike. Takes time proportional to the smaller one. */
 bool read_alike(const owned_value &a, const owned_value &b);
 
-/* An order of values without elements, in which those that read alike are equal. */
+/* An order of values without elements, in which values that are shown alike are equal. */
 std::strong_ordering order_of(const look &a, const look &b);
 
 } // namespace compare

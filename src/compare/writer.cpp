@@ -1,4 +1,4 @@
-/* writer.cpp: names, facts and values as a person reads them. */
+/* writer.cpp: writes names, facts and values for people. */
 
 #include "compare/writer.h"
 
@@ -16,7 +16,8 @@ namespace {
 
 constexpr std::size_t TIMES_SIZE = 16;
 constexpr std::size_t AT_LEAST = 1 << 20;
-constexpr std::size_t LINE = 256;     /* no line of a source has a longer text: such texts are not counted */
+constexpr std::size_t LINE = 256;     /* texts of up to this length are not counted, because a line of a source may have
+                                       * them */
 constexpr std::size_t PORTION = 4096; /* bytes that are escaped at once */
 
 void append_to(std::string &text, std::string_view piece) {

@@ -1,4 +1,4 @@
-/* writer.h: names, facts and values as a person reads them. */
+/* writer.h: writes names, facts and values for people. */
 #ifndef CDGEN_COMPARE_WRITER_H
 #define CDGEN_COMPARE_WRITER_H
 
@@ -10,8 +10,8 @@
 
 namespace compare {
 
-/* Thrown for databases made by hand in which so many references lead to the same texts that writing them would take far
- * more room than the databases do. */
+/* Thrown for forged databases in which so many references lead to the same texts that the output would be far larger
+ * than the databases. */
 struct too_entangled : std::runtime_error {
     using std::runtime_error::runtime_error;
 };
@@ -19,26 +19,26 @@ struct too_entangled : std::runtime_error {
 /* How much may be written about databases.
  *
  * In a database that was compiled each long text has one owner, so all of them together are no larger than the file. In
- * one made by hand, many references may lead to one text, and a long name may have many parts. */
+ * a forged one, many references may lead to one text, and a record with a long name may have many parts. */
 class allowance {
 public:
     /* size: of the databases together, in bytes. */
     explicit allowance(std::size_t size);
 
-    /* Counts a long text. Throws too_entangled where it exceeds what is left. length: in bytes. */
+    /* Counts a long text. Throws too_entangled if it exceeds the rest of the allowance. length: in bytes. */
     void spend(std::size_t length);
 
 private:
     std::size_t left;
 };
 
-/* Writes values as a person reads them: 5, 0.1, 'text', 0x0102, [1, 2], {Int32 0}, nothing, misplaced 5. Functions
- * throw too_entangled beyond an allowance. */
+/* Writes values for people: 5, 0.1, 'text', 0x0102, [1, 2], {Int32 0}, nothing, misplaced 5. Its functions throw
+ * too_entangled if the allowance is exceeded. */
 class writer {
 public:
     using taker = std::function<void(std::string_view)>;
 
-    /* size: of the databases together, in bytes. The pieces of what is written go to `to`. */
+    /* size: of the databases together, in bytes. The output is passed to `to` in pieces. */
     writer(std::size_t size, taker to);
 
     void write(std::string_view plain) const {
@@ -46,7 +46,8 @@ public:
     }
     void write_value(const owned_value &value);
     void write_fact(const fact &f);
-    /* The name of a record, or what an entry of a list has in its place. Nothing for a record that has none. */
+    /* Writes the name of a record, or what identifies an entry of a list. Writes nothing for a record without a name.
+     * */
     void write_name(const node &n);
 
 private:

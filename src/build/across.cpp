@@ -1,4 +1,4 @@
-/* across.cpp: what contradicts itself in classes that are built together. */
+/* across.cpp: conflicts between classes that are built together. */
 
 #include "build/across.h"
 
@@ -43,8 +43,8 @@ std::string keys_of(const mapping &map) {
 
 } // namespace
 
-/* Where a class begins is known of the last one of a source; usually, it is the only one. Where variable classes are is
- * not known any more. */
+/* The place of a class is known only for the last class of a source, which is usually the only one. The places of
+ * variable classes are no longer known. */
 class_facts facts_of(const check::view &source, std::span<const std::byte> image) {
     cdb::database db(image);
     class_facts facts;
@@ -67,7 +67,7 @@ class_facts facts_of(const check::view &source, std::span<const std::byte> image
     return facts;
 }
 
-/* Once for each source: the first one shows that names or keys are to be distributed anew. */
+/* Reported once for each source; one report is enough to see that names or keys must change. */
 void class_family::warn(check::warning_id id, const mention &at, std::string text) {
     const check::warning &known = check::warnings[id];
     bool is_told =

@@ -1,4 +1,4 @@
-/* across.h: what contradicts itself in classes that are built together, and is right in each of them. */
+/* across.h: conflicts between classes that are built together, each of which is correct alone. */
 #ifndef CDGEN_BUILD_ACROSS_H
 #define CDGEN_BUILD_ACROSS_H
 
@@ -14,7 +14,7 @@
 
 namespace build {
 
-/* The map of a source: under which keys a manager knows the class, and where the class's texts are. */
+/* The class-to-manager map of a source: the keys of the class and the catalog with its texts. */
 struct mapping {
     std::string catalog;
     check::mention manager;
@@ -30,7 +30,7 @@ struct variable_class {
     unsigned reported = 0;
 };
 
-/* What matters to other classes. */
+/* The facts about a source that matter to other classes. */
 struct class_facts {
     std::vector<check::mention> classes; /* their names */
     std::vector<mapping> maps;
@@ -40,10 +40,10 @@ struct class_facts {
 /* The facts of a source without errors, whose database is the image. */
 class_facts facts_of(const check::view &source, std::span<const std::byte> image);
 
-/* All sources of a build so far. */
+/* Compares the sources of a build. */
 class class_family {
 public:
-    /* Adds a source; returns the wanted warnings about it that its predecessors cause: one of each kind at the most. */
+    /* Adds a source. Returns the wanted warnings about conflicts with earlier sources, at most one of each kind. */
     std::vector<check::finding> add(const std::string &source, const class_facts &facts,
                                     const check::warning_set &wanted_warnings);
 

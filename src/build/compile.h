@@ -18,7 +18,7 @@ struct compiled {
     class_facts facts; /* none if there are errors */
 };
 
-/* Gives the findings to `to`, as check_file does. Throws check::cannot_check. Nothing is written. */
+/* Passes the findings to `to`, as check_file does. Throws check::cannot_check. Writes no file. */
 compiled compile(const unit &what, orb_timeval32_t time, const check::warning_set &wanted, const check::sink &to);
 
 } // namespace build

@@ -8,11 +8,11 @@ namespace build {
 
 namespace {
 
-/* What Make takes for a separator, a comment or a pattern if there is no backslash before it. A backslash is only
- * special there, and then has to be doubled. */
+/* The characters that Make takes for a separator, a comment or a pattern without a backslash. A backslash is special
+ * only before these, and must be doubled there. */
 constexpr std::string_view ESCAPED = " \t#:";
 
-/* Backslashes at the end of what has been written. */
+/* The number of backslashes at the end of the output so far. */
 size_t backslashes_of(const std::string &text) {
     auto last = std::find_if(text.rbegin(), text.rend(), [](char c) { return c != '\\'; });
     return static_cast<size_t>(last - text.rbegin());

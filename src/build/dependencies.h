@@ -10,8 +10,8 @@
 
 namespace build {
 
-/* A file's name as a rule has it. Throws wrong_request for one that no rule can have. What Make and Ninja read in
- * different ways stays as it is: Make cannot read = and %, which Ninja can. */
+/* A file's name as it is written in a rule. Throws wrong_request for a name that cannot be written in any rule.
+ * Characters that Make and Ninja read differently are not escaped: Make cannot read = and %, but Ninja can. */
 std::string rule_name(std::string_view path);
 
 /* A rule for each unit. */

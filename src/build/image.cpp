@@ -25,7 +25,7 @@ vx_uint32_t word_at(std::span<const std::byte> image, size_t place) {
     return cdb_checksum_word<vx_uint32_t>(reinterpret_cast<const char *>(image.data()) + place);
 }
 
-/* The checksum without what the time's two words add to it. */
+/* The checksum without the two words of the time. */
 vx_uint32_t timeless_checksum(std::span<const std::byte> image) {
     return word_at(image, CHECKSUM) ^ word_at(image, TIME) ^ word_at(image, TIME + sizeof(vx_uint32_t));
 }

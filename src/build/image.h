@@ -9,10 +9,10 @@
 
 namespace build {
 
-/* Puts a time into an image in the machine's own byte order, and corrects the checksum. */
+/* Writes a time to an image in the machine's own byte order, and corrects the checksum. */
 void set_time(std::span<std::byte> image, orb_timeval32_t time);
 
-/* Whether a file holds the same database as an image, apart from the time and what the checksum owes to it. */
+/* True if a file contains the same database as an image, apart from the time and its effect on the checksum. */
 bool is_same_but_time(std::span<const std::byte> image, std::span<const std::byte> file);
 
 } // namespace build

@@ -1,4 +1,4 @@
-/* plan.cpp: which databases are made of which sources. */
+/* plan.cpp: plans which databases are made from which sources. */
 
 #include "build/plan.h"
 

@@ -1,4 +1,4 @@
-/* time.cpp: which time a database gets. */
+/* time.cpp: determines the time in databases. */
 
 #include "build/time.h"
 

@@ -1,4 +1,4 @@
-/* time.h: which time a database gets. */
+/* time.h: determines the time in databases. */
 #ifndef CDGEN_BUILD_TIME_H
 #define CDGEN_BUILD_TIME_H
 
@@ -10,16 +10,16 @@
 
 namespace build {
 
-/* What was asked for makes no sense. The text is for the user. */
+/* The request is invalid. The text is for the user. */
 struct wrong_request : std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
-/* What people and build systems say about the time. */
+/* The option and the environment variables for the time. */
 struct time_wishes {
     std::optional<std::string> option = {};      /* "none", "now" or seconds since 1970 */
-    std::optional<std::string> environment = {}; /* SOURCE_DATE_EPOCH; counts without an option */
-    bool forced_empty = false;                   /* VX_CDB_FORCE_EMPTY_TIMESTAMP is there; counts before all */
+    std::optional<std::string> environment = {}; /* SOURCE_DATE_EPOCH; used if there is no option */
+    bool forced_empty = false;                   /* VX_CDB_FORCE_EMPTY_TIMESTAMP exists; overrides everything */
 };
 
 /* The time to be written; 0 is none. Throws wrong_request. */

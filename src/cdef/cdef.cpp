@@ -15,8 +15,8 @@ namespace {
 
 constexpr std::string_view SHIELD = "./";
 
-/* The library would take an argument [a,b] for two, a and b, and [a] for a. As ./[a,b] it passes; that is the same
- * file, and the option takes the beginning off again. */
+/* CLI11 would take an argument [a,b] for two arguments, a and b, and [a] for a. It does not change ./[a,b], which is
+ * the same file; the option removes the ./ again. */
 bool is_in_brackets(std::string_view argument) {
     return argument.starts_with('[') && argument.ends_with(']');
 }
@@ -26,7 +26,7 @@ std::vector<std::string> shielded(int argc, char **argv) {
     for (std::string &argument : arguments)
         if (is_in_brackets(argument))
             argument.insert(0, SHIELD);
-    std::reverse(arguments.begin(), arguments.end()); /* the library wants the last one first */
+    std::reverse(arguments.begin(), arguments.end()); /* CLI11 expects the last argument first */
     return arguments;
 }
 
@@ -43,8 +43,8 @@ void unshield_arguments(CLI::App &app) {
             option->transform(unshielded);
 }
 
-/* What is not understood comes before what is missing, which is often missed only because of it. Behind "--" there are
- * no options. */
+/* Unknown options are reported before missing ones, because a misspelt option is often the reason that one is missing.
+ * After "--" there are no options. */
 std::string complaint(const CLI::App &app, const CLI::Error &usage) {
     auto code = static_cast<CLI::ExitCodes>(usage.get_exit_code());
     std::vector<std::string> unknown = app.remaining(true);

@@ -9,7 +9,7 @@
 
 namespace {
 
-/* No exception: JSON values are destroyed on its way, and that takes memory too. */
+/* Does not throw, because unwinding would destroy JSON values, which takes memory too. */
 [[noreturn]] void end_without_memory() {
     std::fputs("cdef: out of memory\n", stderr);
     std::exit(cdef::FAILED);

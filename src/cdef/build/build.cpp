@@ -1,4 +1,4 @@
-/* build.cpp: the subcommand that makes databases of sources. */
+/* build.cpp: the subcommand that builds databases from sources. */
 
 #include "cdef/build/build.h"
 
@@ -63,7 +63,7 @@ orb_timeval32_t wanted_time(const build_options &options) {
                           {static_cast<vx_uint32_t>(now.tv_sec), static_cast<vx_uint32_t>(now.tv_usec)});
 }
 
-/* What the options say, and where they say nothing, the project file. */
+/* The settings from the options or, where an option is missing, from the project file. */
 build::naming naming_of(const build_options &options, const config::settings &settings) {
     std::string order = options.order.value_or(settings.byte_order.empty() ? "native" : settings.byte_order);
     build::naming how = {options.file, options.directory, byte_orders.at(order)};
@@ -72,7 +72,7 @@ build::naming naming_of(const build_options &options, const config::settings &se
     return how;
 }
 
-/* What is to be made, and by which rules. */
+/* The databases to be made, and the settings for them. */
 struct assignment {
     std::vector<build::unit> units;
     std::vector<finding_rules> rules;  /* for each of them */
@@ -126,7 +126,8 @@ int build_all(const build_options &options) {
         return OK;
     }
     std::string dependencies = options.depfile ? build::dependencies_of(units) : "";
-    signal(SIGXFSZ, SIG_IGN); /* a file that may not grow and a stream that nobody reads are errors of the call */
+    signal(SIGXFSZ, SIG_IGN); /* writing to a closed pipe or beyond a size limit then fails with an error instead of a
+                               * signal */
     signal(SIGPIPE, SIG_IGN);
     for (const std::string &directory : directories)
         make_directory(directory);

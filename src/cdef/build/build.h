@@ -1,4 +1,4 @@
-/* build.h: one run of the subcommand that makes databases of sources. */
+/* build.h: one run of the subcommand that builds databases from sources. */
 #ifndef CDGEN_CDEF_BUILD_BUILD_H
 #define CDGEN_CDEF_BUILD_BUILD_H
 
@@ -22,7 +22,7 @@ struct run_options {
     bool sync;
 };
 
-/* What became of one source. */
+/* The result for one source. */
 struct outcome {
     std::vector<check::finding> findings;
     check::totals count;
@@ -39,7 +39,7 @@ public:
 
     /* Compiles a source and writes its databases; several threads may do so at once. */
     outcome make(size_t index) const;
-    /* Shows what was found in a source; to be called in order, by one thread. */
+    /* Shows the findings in a source. Must be called in order, by one thread. */
     void show(size_t index, outcome &&made);
     /* Shows a summary of many sources. Returns the exit status. */
     int finish();
@@ -53,8 +53,8 @@ private:
     std::unique_ptr<report::writer> writer;
     progress line;
     size_t databases = 0, written = 0, unchanged = 0;
-    bool all_pass = true; /* no source has errors */
-    bool no_fault = true; /* all files could be read and written */
+    bool all_pass = true; /* true: no source has errors */
+    bool no_fault = true; /* true: all files could be read and written */
 };
 
 } // namespace cdef::build_command

@@ -1,4 +1,4 @@
-/* progress.cpp: the line on a terminal that says how far a long build has come. */
+/* progress.cpp: the progress line of a long build on a terminal. */
 
 #include "cdef/build/progress.h"
 

@@ -1,4 +1,4 @@
-/* progress.h: the line on a terminal that says how far a long build has come. */
+/* progress.h: the progress line of a long build on a terminal. */
 #ifndef CDGEN_CDEF_BUILD_PROGRESS_H
 #define CDGEN_CDEF_BUILD_PROGRESS_H
 
@@ -7,7 +7,7 @@
 
 namespace cdef::build_command {
 
-/* "[3/17] name", cut to so many columns; a name cannot steer the terminal. */
+/* "[3/17] name", cut to this many columns. Control characters in the name are escaped. */
 std::string progress_line(std::size_t done, std::size_t all, const std::string &name, std::size_t columns);
 
 /* Shows the line on standard error if that is a terminal that can clear it, and if there is more than one source;
@@ -22,7 +22,7 @@ public:
     }
 
     void show(std::size_t done, const std::string &name);
-    /* Before anything else is written. */
+    /* Clears the line; called before anything else is written. */
     void clear();
 
 private:

@@ -1,4 +1,4 @@
-/* run.cpp: one run of the subcommand that makes databases of sources. */
+/* run.cpp: one run of the subcommand that builds databases from sources. */
 
 #include "build/compile.h"
 #include "cdef/build/build.h"
@@ -20,7 +20,7 @@ size_t count_of_databases(const std::vector<build::unit> &units) {
     return count;
 }
 
-/* Before anything can fail, so that what a killed build left goes away even if nothing is written. */
+/* Done before anything can fail, so that the temporary file of a killed build is removed even if nothing is written. */
 void clear_remains(const build::unit &what) {
     for (const build::output &made : what.outputs)
         if (made.path != "-")
@@ -67,7 +67,8 @@ void build_run::make_databases(size_t index, outcome &made) const {
     }
 }
 
-/* What other classes say of this one comes after what it says of itself. Its database has been written meanwhile. */
+/* Conflicts with other classes are reported after the findings in the source itself. Its database has been written by
+ * then. */
 void build_run::show(size_t index, outcome &&made) {
     for (check::finding &found : family.add(units[index].source, made.facts, options.rules[index].wanted)) {
         made.findings.push_back(std::move(found));

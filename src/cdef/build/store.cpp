@@ -1,4 +1,4 @@
-/* store.cpp: puts a database in its place. */
+/* store.cpp: writes a database to its file. */
 
 #include "cdef/build/store.h"
 
@@ -21,7 +21,7 @@ std::string_view text_of(std::span<const std::byte> image) {
     return {reinterpret_cast<const char *>(image.data()), image.size()};
 }
 
-/* By their inodes: they may have different names. */
+/* Compares inodes, because one file may have different names. */
 bool is_same_file(const struct stat &target, const std::string &source) {
     struct stat st = {};
     int found = source == "-" ? fstat(STDIN_FILENO, &st) : stat(source.c_str(), &st);

@@ -1,4 +1,4 @@
-/* store.h: puts a database in its place. */
+/* store.h: writes a database to its file. */
 #ifndef CDGEN_CDEF_BUILD_STORE_H
 #define CDGEN_CDEF_BUILD_STORE_H
 
@@ -10,8 +10,8 @@ namespace cdef::build_command {
 
 enum class stored { WRITTEN, UNCHANGED };
 
-/* Replaces the file unless it has the same database already, the time aside. "-" is standard output. sync: the database
- * is on the disk before the function returns. Throws failure; the file is then as it was. */
+/* Replaces the file unless it already has the same database, apart from the time. "-" is standard output. sync: the
+ * database is on the disk before the function returns. Throws failure and then leaves the file as it was. */
 stored store(std::span<const std::byte> image, const std::string &path, const std::string &source, bool sync);
 
 } // namespace cdef::build_command

@@ -16,7 +16,8 @@
 
 namespace cdef::build_command {
 
-/* Pieces of work that threads take one after another, and their results. What a piece throws is thrown by take(). */
+/* Pieces of work that threads take one after another, and their results. An exception of a piece is thrown by take().
+ * */
 template <class Result> class worker_pool {
 public:
     using work_function = std::function<Result(std::size_t)>;
@@ -28,7 +29,7 @@ public:
     }
     worker_pool(const worker_pool &) = delete;
     worker_pool &operator=(const worker_pool &) = delete;
-    /* No further piece is begun. */
+    /* Stops: no further piece is begun. */
     ~worker_pool() {
         {
             std::lock_guard hold(guard);
@@ -38,7 +39,7 @@ public:
             thread.join();
     }
 
-    /* Waits for a piece's result, which can be taken once. */
+    /* Waits for a piece's result and returns it. Each result can be taken only once. */
     Result take(std::size_t index) {
         std::unique_lock hold(guard);
         finished.wait(hold, [&] { return results[index].value.has_value() || results[index].error; });
@@ -80,8 +81,8 @@ private:
     std::vector<std::thread> pool;
 };
 
-/* Does the pieces 0 to count - 1, so many at once, and delivers their results in order. With more than one at once,
- * signals that end the program wait until no piece is doing uninterrupted work. */
+/* Does the pieces 0 to count - 1, this many at once, and delivers their results in order. With more than one at once,
+ * signals that end the program are held back until no piece is doing uninterrupted work. */
 template <class Result>
 void do_in_order(std::size_t count, unsigned at_once, const std::function<Result(std::size_t)> &work,
                  const std::function<void(std::size_t, Result &&)> &deliver) {

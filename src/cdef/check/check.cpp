@@ -1,4 +1,4 @@
-/* check.cpp: all that is wrong with sources, and what is odd in them. */
+/* check.cpp: the subcommand that reports the errors and warnings in sources. */
 
 #include "check/check.h"
 
@@ -22,7 +22,7 @@ struct check_options {
     std::vector<std::string> sources;
     finding_options findings;
     bool fixes = false;
-    bool changes_nothing = false; /* only shows what would be fixed */
+    bool changes_nothing = false; /* only show what would be fixed */
 };
 
 check::totals check_source(const std::string &source, const check_options &options, const check::warning_set &wanted,
@@ -34,14 +34,14 @@ check::totals check_source(const std::string &source, const check_options &optio
     return check::check_file(source, wanted, add);
 }
 
-/* Standard output takes the findings in most forms, so the fixed source or the diff cannot go there too. */
+/* In most forms the findings go to standard output, so the fixed source or the diff cannot go there too. */
 void require_output(const check_options &options) {
     bool from_input = std::find(options.sources.begin(), options.sources.end(), "-") != options.sources.end();
     if (options.fixes && (options.changes_nothing || from_input) && options.findings.form != "text")
         throw failure("--fix writes to standard output here, and so does --format " + options.findings.form);
 }
 
-/* For each source, before anything is shown: a project file may have errors. */
+/* For each source; read before anything is shown, because a project file may have errors. */
 std::vector<finding_rules> rules_of(const check_options &options) {
     project_files projects(options.findings.project);
     std::vector<finding_rules> rules;

@@ -1,4 +1,4 @@
-/* diff.cpp: what differs between two databases, and for whom it matters. */
+/* diff.cpp: the subcommand that shows what differs between two databases, and for whom it matters. */
 
 #include "cdef/cdef.h"
 #include "cdef/diff/document.h"
@@ -24,14 +24,14 @@ using compare::node_kind;
 struct diff_options {
     std::string before;
     std::string after;
-    std::string compat; /* the level up to which breaches are shown, and nothing else; empty: everything is shown */
+    std::string compat; /* show only differences that break rules up to this level; empty: show all differences */
     std::string form;
 };
 
 /* ---- Output ---------------------------------------------------------------------------------------------------- */
 
-/* Text on its way to standard output. The beginning is kept back until it is certain that the comparison succeeds: half
- * a comparison would mislead. */
+/* Writes text to standard output. The beginning is held back until it is certain that the comparison succeeds, because
+ * half a comparison would mislead. */
 class held_output {
 public:
     void take(std::string_view piece) {
@@ -44,11 +44,11 @@ public:
         else
             is_too_long = true;
     }
-    /* Whether more was to be written than is kept. */
+    /* True if there was more output than is kept. */
     bool has_lost() const {
         return is_too_long;
     }
-    /* Forgets what was kept; from now on everything is written. */
+    /* Discards the kept output; from now on everything is written. */
     void begin_again() {
         out.text.clear();
         is_open = true;
@@ -67,7 +67,7 @@ private:
 
 /* ---- Forms ----------------------------------------------------------------------------------------------------- */
 
-/* Rules that a difference breaks, as far as somebody asked for them. */
+/* The rules that a difference breaks, if they are to be shown. */
 diff::reasons rules_broken(const difference &d, compare::level up_to) {
     diff::reasons rules;
     for (compare::breach b : d.broken)
@@ -128,11 +128,12 @@ std::string check_level(const std::string &option) {
 }
 
 struct outcome {
-    bool found = false;                /* any of the differences that were asked for */
-    std::vector<std::string> mentions; /* what some want to know in any case; no difference of its own */
+    bool found = false;                /* true: there was a difference that is shown */
+    std::vector<std::string> mentions; /* worth mentioning, but not counted as a difference */
 };
 
-/* Whoever maps a database depends on its byte order, and whoever chooses between two goes by their versions. */
+/* Programs that map a database depend on its byte order, and programs that choose between two compare their versions.
+ * */
 std::string mention_of_order(const compared &before, const compared &after) {
     return after.in.name + ": the other byte order than " + before.in.name;
 }
@@ -179,7 +180,7 @@ outcome write_to(held_output &out, const compared &before, const compared &after
     return write_differences(before, after, options, form);
 }
 
-/* What a long comparison writes is not kept; once it is known that there is an end, it is made again. */
+/* The output of a long comparison is not kept. When the comparison is known to succeed, it is done again. */
 int run(const diff_options &options) {
     if (options.before == "-" && options.after == "-")
         throw failure("only one of the two can be standard input");

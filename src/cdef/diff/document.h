@@ -15,9 +15,9 @@ public:
     /* size: of both databases, in bytes. */
     document(report::output out, std::size_t size) : to(std::move(out)), values(size) {}
 
-    /* The names of the databases as they were given. */
+    /* The names of the databases as given on the command line. */
     void begin(const std::string &before, const std::string &after);
-    /* why: empty if nobody asked for the reasons. */
+    /* why: empty if reasons are not shown. */
     void add(const compare::difference &d, const reasons &why);
     /* A class of the second database has a lower version. */
     void mention_version(const compare::difference &d);

@@ -14,7 +14,7 @@ using compare::node_kind;
 using compare::owned_value;
 using compare::shape;
 
-/* A reference of a field that no compiled file uses may be none or 0, which are equal. */
+/* A reference in a field that no compiled file uses may be "none" or 0, which are equal. */
 facts::fact fact_of_number(std::uint32_t number, cdb::meaning as) {
     if (as == cdb::meaning::UNUSED && number == CDB_NONE)
         return std::uint64_t{0};

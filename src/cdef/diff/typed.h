@@ -7,14 +7,14 @@
 
 namespace cdef::diff {
 
-/* Each function returns a value on one line, and throws compare::too_entangled where compare::writer does. */
+/* Each function returns a JSON value on one line, and throws compare::too_entangled when compare::writer does. */
 class typed_values {
 public:
     /* size: of the databases together, in bytes. */
     explicit typed_values(std::size_t size) : left(size) {}
 
     std::string of_fact(const compare::fact &f);
-    /* The name of a record, or what an entry of a list has in its place. null for a record that has none. */
+    /* The name of a record, or what identifies an entry of a list; null for a record without a name. */
     std::string of_name(const compare::node &n);
 
 private:
@@ -30,7 +30,7 @@ private:
     std::string made;
 };
 
-/* The data type of a fact that is a value; nothing for any other fact. */
+/* The data type of a fact that is a value; no value for any other fact. */
 std::optional<std::string_view> type_of(const compare::fact &f);
 
 } // namespace cdef::diff

@@ -1,5 +1,5 @@
-/* dump.h: what the forms of `cdef dump` share: the facts that a database states, how they read as text, and the
- * sink that a form is. */
+/* dump.h: the parts that the forms of `cdef dump` share: the facts of a database, their texts, and the interface of a
+ * form, which is a sink for facts. */
 #ifndef CDGEN_CDEF_DUMP_H
 #define CDGEN_CDEF_DUMP_H
 
@@ -24,7 +24,7 @@ using facts::named_bits;
 using facts::none;
 using facts::word;
 
-/* As the listing shows it, on one line and free of bytes that a terminal would act upon. */
+/* The text of a fact in the listing: one line, without bytes that a terminal would act upon. */
 void append(std::string &to, const fact &f);
 std::string as_text(const fact &f);
 
@@ -33,21 +33,22 @@ std::string as_text(const fact &f);
 /* The number in a field of an area. */
 std::uint32_t number_in(const cdb::bytes &area, std::size_t at, const cdb::field &f);
 
-/* The data type that a record names for its values; VX_UNKNOWN if it names none. */
+/* The data type that a record has for its values; VX_UNKNOWN if it has none. */
 vx_data_type_t data_type_in(const cdb::record_format &format, const cdb::bytes &area, std::size_t at);
 
-/* Of the list table that a reference leads into; not for other targets. */
+/* The list table that a reference leads into. The reference must not have another target. */
 const cdb::bytes &lists_of(const cdb::class_tables &tables, cdb::target to);
 
 /* ---- Forms ----------------------------------------------------------------------------------------------------- */
 
-/* How a fact or a group of them is called. */
+/* The names of a fact or of a group of facts. */
 struct label {
-    std::string_view key;   /* in JSON; of no account in a list */
+    std::string_view key;   /* in JSON; not used in a list */
     std::string_view title; /* in the listing; empty: not shown there */
 };
 
-/* Takes the facts of a database in their order. Groups nest; a list's members are facts or groups without keys. */
+/* Receives the facts of a database in their order. Groups may be nested; the members of a list are facts or groups
+ * without keys. */
 class sink {
 public:
     sink() = default;
@@ -66,7 +67,7 @@ void show_listing(const input &in, const readability &found, bool with_offsets, 
 void show_json(const input &in, const readability &found, bool with_offsets);
 void show_hex(const input &in);
 
-/* Tells a sink all facts of a readable database. */
+/* Passes all facts of a readable database to a sink. */
 void walk(const cdb::database &db, const readability &found, sink &to, bool with_offsets);
 
 } // namespace cdef::dump

@@ -1,4 +1,4 @@
-/* fields.cpp: where the fields of records and what they lead to are. */
+/* fields.cpp: the places of fields, and of the lists that they lead to. */
 
 #include "cdef/dump/dump.h"
 

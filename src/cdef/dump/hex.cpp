@@ -1,5 +1,5 @@
-/* hex.cpp: every byte of a file and what it is. Nothing is taken for granted: the file may be damaged. Each
- * line costs no more than its bytes deserve, so that what comes out is in proportion to the file. */
+/* hex.cpp: shows every byte of a file and its meaning. The file may be damaged, so nothing is taken for granted. The
+ * length of each line is limited, so that the size of the output is proportional to the file. */
 
 #include "text/hex.h"
 #include "cdef/dump/dump.h"
@@ -56,7 +56,7 @@ private:
     void show(const cdb::region &r);
     void show_line(const cdb::region &r, std::size_t at);
     void append_name(const cdb::region &r);
-    /* Each appends ": " and what the bytes mean, or nothing. */
+    /* Each of these functions appends ": " and the meaning of the bytes, or nothing. */
     void append_meaning(const cdb::region &r);
     void append_field(const cdb::region &r);
     void append_reference(const cdb::region &r);
@@ -86,7 +86,7 @@ private:
     output out;
 };
 
-/* Where a record begins in the file. */
+/* The offset of a record in the file. */
 std::size_t start_of(const cdb::region &r) {
     return r.offset - r.what->offset;
 }
@@ -104,7 +104,7 @@ cdb::meaning hex_form::meaning_of(const cdb::region &r) {
     return of.facts[static_cast<std::size_t>(r.what - of.fields.data())].as;
 }
 
-/* Of a region in a section: values and references are stored nowhere else. */
+/* For a region in a section. Values and references are stored nowhere else. */
 const cdb::class_tables &hex_form::tables(const cdb::region &r) {
     if (known_section != r.section) {
         known_tables = cdb::tables_of(db, r.section.value());
@@ -133,7 +133,7 @@ void append_offset(std::string &to, std::size_t offset) {
         to += text::HEX_DIGITS[offset >> shift & 0xF];
 }
 
-/* An offset into an area, and where that is in the file. */
+/* Shows an offset into an area, and the corresponding offset in the file. */
 void hex_form::append_place(const cdb::bytes &area, std::size_t at) {
     append_number(out.text, at);
     if (at < area.size())
@@ -291,7 +291,7 @@ void hex_form::show(const cdb::region &r) {
         show_line(r, at);
 }
 
-/* Of a damaged file a type may be asked for before its list has been shown. */
+/* In a damaged file, a type may be needed before its list has been shown. */
 void hex_form::show() {
     cdb::regions(db, [this](const cdb::region &r) { note_types(r); });
     lists.sort();

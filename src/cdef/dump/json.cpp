@@ -10,7 +10,7 @@ namespace cdef::dump {
 
 namespace {
 
-/* Writes groups as it meets them. Facts, however many members they have, take a line each. */
+/* Writes groups as they come. Each fact is on one line, however many members it has. */
 class json_form : public sink {
 public:
     void open(const label &group) override {

@@ -1,4 +1,4 @@
-/* walk.cpp: the walk over the facts of a database, in the order of the file. Each form takes them as it likes. */
+/* walk.cpp: the walk over the facts of a database, in the order of the file. Each form shows them in its own way. */
 
 #include "cdef/dump/dump.h"
 #include "reader/ownership.h"
@@ -19,7 +19,7 @@ struct record_at {
     cdb::bytes area;
     std::size_t at;
     const cdb::class_tables &tables;
-    vx_data_type_t type = VX_UNKNOWN; /* of its values, where the record itself does not name one */
+    vx_data_type_t type = VX_UNKNOWN; /* the type of its values, if the record itself does not have it */
 };
 
 constexpr cdb::class_tables NO_TABLES = {};
@@ -68,7 +68,7 @@ private:
     bool with_offsets;
     checksum sum;
     const cdb::ownership &owners;
-    /* Of several with one number, the first. */
+    /* If several have the same number, the first one counts. */
     named_by_number variables; /* dynamic attributes, by variable ID */
     named_by_number managers;
     std::string heading; /* of the record that is being opened */
@@ -116,7 +116,8 @@ std::size_t walker::place_of(const cdb::bytes &area) const {
 
 /* ---- Values ---------------------------------------------------------------------------------------------------- */
 
-/* An array's elements are of one type, so they are told without it; those of structured data with it. */
+/* The elements of an array have one type, so they are shown without it; those of structured data are shown with their
+ * types. */
 void walker::show_element(vx_data_type_t container, const cdb::value &element, std::size_t cell, std::size_t strings) {
     std::string_view type = cdb::name_of(element.type());
     if (container != VX_SD_PTR)
@@ -171,7 +172,7 @@ void walker::show_record(const record_at &r, std::string_view key, std::string_v
     out.close();
 }
 
-/* Each field has its row of meanings at its own position. */
+/* The row with a field's meaning is at the same position as the field. */
 void walker::show_fields(const record_at &r) {
     for (std::size_t i = 0; i < r.format.fields.size(); ++i) {
         const cdb::field &f = r.format.fields[i];
@@ -229,7 +230,7 @@ void walker::show_reference(const record_at &r, const cdb::field &f, cdb::meanin
         out.add(same(f.name), any_text{r.tables.strings.text(std::size_t{place})});
 }
 
-/* A reference as it stands, or an array of them. */
+/* A reference shown as a number, or an array of references. */
 void walker::show_place(const record_at &r, const cdb::field &f) {
     auto add = [&](const label &what, std::size_t i) {
         auto place = r.area.number<std::uint32_t>(r.at + f.offset + i * f.width);
@@ -245,7 +246,7 @@ void walker::show_place(const record_at &r, const cdb::field &f) {
     out.close();
 }
 
-/* What another record owns, or nobody, may be there for many; it is shown with its owner only. */
+/* Many references may lead to something that another record owns, so it is shown with its owner only. */
 void walker::show_list(const record_at &r, const cdb::field &f) {
     const cdb::list_kind &kind = cdb::list_kind_of(f.to);
     const cdb::bytes &lists = lists_of(r.tables, f.to);

@@ -1,4 +1,4 @@
-/* codes.cpp: all that cdef reports under a code. */
+/* codes.cpp: everything that cdef reports with a code. */
 
 #include "cdef/explain/codes.h"
 

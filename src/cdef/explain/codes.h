@@ -1,4 +1,4 @@
-/* codes.h: all that cdef reports under a code, and what is known about it. */
+/* codes.h: everything that cdef reports with a code, and its explanation. */
 #ifndef CDGEN_CDEF_EXPLAIN_CODES_H
 #define CDGEN_CDEF_EXPLAIN_CODES_H
 
@@ -11,7 +11,7 @@
 
 namespace cdef {
 
-/* What a code means. */
+/* The explanation of a code. */
 struct explanation {
     std::string_view code;
     std::string_view severity;
@@ -26,11 +26,11 @@ struct explanation {
  * codes. */
 std::vector<explanation> explanations();
 
-/* The one with a code, in any case, or with a warning's name. Null if there is none. */
+/* Finds an explanation by its code, in upper or lower case, or by a warning's name. Null if there is none. */
 const explanation *find(const std::vector<explanation> &all, std::string_view code);
 
-/* The codes and the names of warnings that are one edit from a text. Numbers that are close to each other mean nothing
- * alike, so nothing else is near. */
+/* The codes and the names of warnings that differ from a text by one edit. Codes with similar numbers have nothing in
+ * common, so others are not suggested. */
 language::name_list nearest(const std::vector<explanation> &all, std::string_view text);
 
 } // namespace cdef

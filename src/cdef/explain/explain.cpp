@@ -1,4 +1,4 @@
-/* explain.cpp: what a code of a finding means, how it comes about, and what to do. */
+/* explain.cpp: the subcommand that explains codes: cause, cure and an example. */
 
 #include "cdef/cdef.h"
 #include "cdef/explain/codes.h"
@@ -25,7 +25,7 @@ struct explain_options {
     std::string form;
 };
 
-/* A message ends where the details follow. */
+/* The message without the place for details at its end. */
 std::string title_of(const explanation &shown) {
     std::string_view title = shown.title;
     return std::string(title.substr(0, title.find_last_not_of(": ") + 1));

@@ -1,4 +1,4 @@
-/* first_source.cpp: the source that a new class begins with. */
+/* first_source.cpp: makes the first source of a new class. */
 
 #include "cdef/new/first_source.h"
 
@@ -69,7 +69,7 @@ void replace_all(std::string &text, std::string_view what, const std::string &by
         text.replace(at, what.size(), by);
 }
 
-/* A name without what is special to the language, to shells or to file systems. */
+/* True for a name without characters that are special to the language, to shells or to file systems. */
 std::string plain(std::string name) {
     for (char &c : name)
         if (std::isalnum(static_cast<unsigned char>(c)) == 0 && c != '-')
@@ -78,7 +78,7 @@ std::string plain(std::string name) {
     return name.substr(0, LONGEST);
 }
 
-/* Whether the source has no errors and no warnings, and its class has the name. */
+/* True if the source has no errors and no warnings, and its class has the name. */
 bool says(const std::string &source, const std::string &name) {
     check::warning_set all;
     all.fill(true);

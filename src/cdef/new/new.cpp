@@ -28,7 +28,7 @@ struct new_options {
     throw failure(path + ": " + std::strerror(errno));
 }
 
-/* Writes a file that must not exist. If that fails, there is none. */
+/* Writes a file that must not exist. If that fails, no file remains. */
 void make_file(const std::string &path, const std::string &text) {
     constexpr mode_t MODE = 0666;
     int fd = open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, MODE);
@@ -59,7 +59,7 @@ int write_first_source(const new_options &options) {
         print(*source);
         return OK;
     }
-    signal(SIGXFSZ, SIG_IGN); /* a file that may not grow is an error of the call */
+    signal(SIGXFSZ, SIG_IGN); /* writing beyond a size limit then fails with an error instead of a signal */
     make_file(path, *source);
     return OK;
 }

@@ -31,7 +31,7 @@ bool is_hundred(const cdb::value &v) {
     }
 }
 
-/* The one element of a bound that is an array; nothing if it has not exactly one. */
+/* The element of a bound that is an array of one element; no value for any other bound. */
 std::optional<cdb::value> only_element(const cdb::value &bound) {
     cdb::value_list elements = bound.elements();
     return elements.size() == 1 ? std::optional(elements[0]) : std::nullopt;
@@ -76,8 +76,8 @@ struct bound {
     bool is_own;
 };
 
-/* A number's bytes, or those of the place that a reference leads to where no value of its own is stored: of a number
- * that landed in the attribute of another type. Nothing for a value of its own. */
+/* The bytes of a number, or of a reference that leads to no value of its own, which is really a number that was stored
+ * in an attribute of another type. No value for a reference to a value of its own. */
 std::optional<cell> bytes_of(const bound &b) {
     const cdb::value &v = b.value;
     switch (v.type()) {
@@ -107,7 +107,7 @@ std::optional<wanted_bytes> wanted_in_cells(const bound &low, const bound &high)
         .known = true, .in_arrays = false, .width = width_of(low.value.type()), .low = *first, .high = *second};
 }
 
-/* The same of an array, and whether what the element leads to is the bound's own. */
+/* The same for an array, and whether the bound owns what the element leads to. */
 std::optional<bound> element_of(const bound &array, const class_plan &plan) {
     std::optional<cdb::value> element = only_element(array.value);
     if (!element || !cdb::is_array(array.value.type()))
@@ -116,7 +116,7 @@ std::optional<bound> element_of(const bound &array, const class_plan &plan) {
     return bound{*element, plan.owners->is_own(plan.view.side_tables().strings, place)};
 }
 
-/* False if the only element of a bound leads to what is not the bound's own. */
+/* False if the only element of a bound leads to something that the bound does not own. */
 bool owns_element(const bound &array, const class_plan &plan) {
     std::optional<bound> element = element_of(array, plan);
     return !element || element->is_own;
@@ -133,7 +133,7 @@ wanted_bytes wanted_of(const bound &low, const bound &high, const class_plan &pl
     return wanted;
 }
 
-/* Whether the bytes after those of a narrower number are 0. */
+/* True if the bytes after those of a narrower number are 0. */
 bool is_zero_from(const wanted_bytes &wanted, std::size_t offset) {
     auto zero = [](std::byte b) { return b == std::byte{0}; };
     return std::all_of(wanted.low.begin() + static_cast<std::ptrdiff_t>(offset), wanted.low.end(), zero) &&

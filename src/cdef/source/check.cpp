@@ -1,4 +1,5 @@
-/* check.cpp: what no source can say: fields that no line sets, and sections that the compiler does not make. */
+/* check.cpp: refuses what cannot be written as a source: unusual values in fields that no line sets, and sections that
+ * the compiler does not make. */
 
 #include "cdef/source/check.h"
 
@@ -21,14 +22,14 @@ std::uint32_t number_at(const std::byte *from, std::size_t width) {
     return width == sizeof half ? half : whole;
 }
 
-/* The value that the compiler gives a field in every file; nothing if lines fill it, or if it is layout. */
+/* The value that the compiler gives a field in every file; no value if lines fill it, or if it is layout. */
 std::optional<std::uint32_t> constant_in(const cdb::field_fact &fact) {
     if (fact.is == cdb::role::LAYOUT || (!fact.always && !fact.lines.empty()))
         return std::nullopt;
     return fact.always.value_or(0);
 }
 
-/* Every field that no line fills has the value that the compiler gives it. */
+/* Checks that every field that no line fills has the value that the compiler gives it. */
 template <class Record> void require_plain(const Record &record, const std::string &place) {
     const auto *bytes = reinterpret_cast<const std::byte *>(&record);
     for (const cdb::field &f : cdb::fields_of<Record>) {

@@ -57,7 +57,7 @@ bool can_be_named(const cdb::resource_class &c) {
     return has_all_required(c.record()) && can_be_given("Name", c.name());
 }
 
-/* A name that no line gives can only come from the output file's. */
+/* A name that no line can give can only come from the name of the output file. */
 void require_default_name(const cdb::resource_class &c, std::optional<std::string> &output) {
     if (c.name().find(SUFFIX) != std::string_view::npos || (output && *output != c.name()))
         no_source(place_of("ResourceClass", c.name()), "neither a line nor a file name can give it its name");
@@ -94,7 +94,7 @@ public:
     stanza_record from;
 
 private:
-    /* A required line: without a property it has a value that names none. */
+    /* A required line. Without properties it has a value that names none of them. */
     void write_properties() {
         std::string names = properties_text(rc.rc_props, rc_props, from.place);
         if (!names.empty() || has_all_required(rc))
@@ -144,7 +144,8 @@ struct plain_stanza_writer {
     stanza_record from;
 };
 
-/* A locator is looked up in the last class only, but a line in any class gives it: the latest that can have one. */
+/* A locator is looked up in the last class only, but a line in any class can give it. The latest class that can have
+ * the line gets it. */
 void plan_locator(std::vector<class_plan> &plans) {
     for (const class_plan &plan : plans)
         if (!plan.is_last && plan.view.record().rc_locator != 0)
@@ -244,7 +245,8 @@ void write_long_comment(source_writer &out, std::string_view text) {
         out.comment(text.substr(0, WIDTH));
 }
 
-/* The name of the classes that no line names: the compiler takes it from the output file. Nothing if there are none. */
+/* The name of the classes without a Name line, which the compiler takes from the output file. No value if there are no
+ * such classes. */
 std::optional<std::string> default_name(const std::vector<class_plan> &plans) {
     std::optional<std::string> output;
     for (const class_plan &plan : plans)

@@ -16,7 +16,7 @@ struct no_source_error : std::runtime_error {
 /* Throws no_source_error: what cannot be written, and why. */
 [[noreturn]] void no_source(const std::string &what, const std::string &why);
 
-/* "DynamicClassAttribute 'X'": what a message is about. */
+/* "DynamicClassAttribute 'X'": the subject of a message. */
 std::string place_of(std::string_view kind, std::string_view name);
 
 } // namespace cdef::source

@@ -1,4 +1,4 @@
-/* groups.cpp: which variable class each dynamic attribute names. */
+/* groups.cpp: finds the variable class that each dynamic attribute names. */
 
 #include "cdef/source/groups.h"
 
@@ -11,10 +11,10 @@ namespace cdef::source {
 
 namespace {
 
-/* How many members are looked at, the same ones again after each wrong choice. Careless sources need few choices. */
+/* The most steps of the search, which are repeated after each wrong choice. Careless sources need few choices. */
 constexpr std::size_t LOOKS_MAX = 20'000'000;
 
-/* A dynamic attribute as the lists know it. */
+/* A dynamic attribute as a member of the lists. */
 struct member {
     var_id_t id;
     std::size_t of_class;
@@ -49,7 +49,7 @@ std::vector<member> members_of(const std::vector<class_plan> &classes) {
     return members;
 }
 
-/* Of variable classes with one name the first gets all IDs. */
+/* If several variable classes have the same name, the first gets all IDs. */
 std::vector<group> groups_of(const cdb::database &db) {
     std::vector<group> groups;
     std::unordered_set<std::string> names;
@@ -66,8 +66,8 @@ std::vector<group> groups_of(const cdb::database &db) {
     return groups;
 }
 
-/* Deals members out to lists. A member goes to the one list that waits for its ID; only where several do is there a
- * choice, which may turn out wrong later. */
+/* Distributes members over lists. A member goes to the list whose next ID is the member's. Only if several lists
+ * qualify is there a choice, which may turn out to be wrong later. */
 class dealer {
 public:
     /* No list is empty. */
@@ -79,7 +79,7 @@ public:
             waiting[lists[i].ids[0]].push_back(i);
     }
 
-    /* False if no way was found. */
+    /* Returns false if no distribution was found. */
     bool deal() {
         while (looks < LOOKS_MAX) {
             deal_rest();
@@ -97,7 +97,7 @@ public:
     }
 
 private:
-    /* A list, and how many of its IDs have been dealt out. */
+    /* A list, and how many of its IDs have been used. */
     struct id_list {
         const std::vector<var_id_t> &ids;
         std::size_t done = 0;
@@ -169,7 +169,7 @@ private:
     const std::vector<var_id_t> &members;
     std::vector<id_list> lists;
     std::vector<std::optional<std::size_t>> owners;                 /* lists by member */
-    std::unordered_map<var_id_t, std::vector<std::size_t>> waiting; /* lists by the ID that they wait for */
+    std::unordered_map<var_id_t, std::vector<std::size_t>> waiting; /* lists by their next ID */
     std::vector<choice> choices;
     std::size_t looks = 0;
     std::size_t next = 0; /* member */

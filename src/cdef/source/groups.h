@@ -1,5 +1,5 @@
-/* groups.h: which variable class each dynamic attribute names. A database has it the other way round: variable classes
- * list the IDs of their attributes, in the order of the attributes. */
+/* groups.h: finds the variable class that each dynamic attribute names. In a database, the variable classes list the
+ * IDs of their attributes, in the order of the attributes. */
 #ifndef CDGEN_CDEF_SOURCE_GROUPS_H
 #define CDGEN_CDEF_SOURCE_GROUPS_H
 
@@ -9,13 +9,13 @@
 
 namespace cdef::source {
 
-/* The list that each member is in, by its position among the lists; nothing inside for a member of none. members: IDs,
- * in the order in which the compiler lists them. As long as IDs are unique, each list says which members it means.
- * Where they are not, members are dealt out so that every list comes about. Nothing if no way was found. */
+/* For each member, the position of its list; no value for a member of no list. members: IDs, in the order in which the
+ * compiler lists them. Unique IDs identify their members. Members with equal IDs are distributed so that every list is
+ * complete. Returns no value if no distribution was found. */
 std::optional<std::vector<std::optional<std::size_t>>> deal_out(const std::vector<var_id_t> &members,
                                                                 const std::vector<std::vector<var_id_t>> &lists);
 
-/* Sets the variable class of each dynamic attribute. Throws no_source_error if the lists cannot be had that way. */
+/* Sets the variable class of each dynamic attribute. Throws no_source_error if no source produces the lists. */
 void plan_variable_classes(std::vector<class_plan> &classes, const cdb::database &db);
 
 } // namespace cdef::source

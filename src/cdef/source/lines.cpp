@@ -1,4 +1,5 @@
-/* lines.cpp: the lines of a stanza, from the catalogue's attributes and the facts of the fields that they fill. */
+/* lines.cpp: the lines of a stanza, made from the catalogue's attributes and the facts about the fields that they fill.
+ * */
 
 #include "cdef/source/lines.h"
 
@@ -33,7 +34,7 @@ std::uint32_t number_in(const stanza_line &line, const stanza_record &from) {
                     : from.record.number<std::uint32_t>(line.field->offset);
 }
 
-/* The number that the compiler gives the field without a line. */
+/* The number in the field if there is no line for it. */
 std::uint32_t number_without_line(cdb::meaning as, bool is_completed) {
     switch (as) {
     case NONE_IS_255:
@@ -77,7 +78,7 @@ std::string number_text(std::uint32_t number, cdb::meaning as, const std::string
     }
 }
 
-/* A number that a line can give on its own. */
+/* A number that a line without a special function can give. */
 bool is_plain_number(cdb::meaning as) {
     switch (as) {
     case PLAIN:

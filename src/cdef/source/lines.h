@@ -1,5 +1,5 @@
-/* lines.h: the lines of a stanza, from the catalogue's attributes and the facts of the fields that they fill. A new
- * attribute whose line reads as its field does needs nothing here. */
+/* lines.h: the lines of a stanza, made from the catalogue's attributes and the facts about the fields that they fill. A
+ * new attribute whose line has the same text as its field needs no code here. */
 #ifndef CDGEN_CDEF_SOURCE_LINES_H
 #define CDGEN_CDEF_SOURCE_LINES_H
 
@@ -23,15 +23,15 @@ struct stanza_line {
     }
 };
 
-/* In the order in which a stanza has them: required ones first, since the compiler takes no optional one before it has
- * them all. format: of the record that the stanza fills. start: its offset in the staged record. */
+/* In the order in which a stanza has them: required ones first, because the compiler accepts optional ones only after
+ * them. format: of the record that the stanza fills. start: its offset in the staged record. */
 std::vector<stanza_line> lines_of(std::span<const table_attrs> attributes, const cdb::record_format &format,
                                   std::size_t start = 0);
-/* Those of a stanza in the catalogue. */
+/* The lines of a stanza in the catalogue. */
 const std::vector<stanza_line> &lines_of(stanza_id stanza);
 
-/* Whether the line is a number, a text, or a word that stands for a number, as in the field. Any other line needs a
- * writer of its own. */
+/* True if the line is a number, a text, or a word that stands for a number, as in the field. Any other line needs a
+ * special function. */
 bool is_plain(const stanza_line &line);
 
 /* The record that a stanza is written from. */
@@ -48,26 +48,26 @@ template <class Record> cdb::bytes bytes_of(const Record &record) {
     return {std::as_bytes(std::span(&record, 1)), std::endian::native};
 }
 
-/* Whether the field is what the compiler makes of it without the line. The line is plain. */
+/* True if the field has the value that it has without the line. The line must be plain. */
 bool is_default(const stanza_line &line, const stanza_record &from);
 
-/* The value of a plain line; nothing if the stanza needs no such line. Throws no_source_error if it needs one, but no
- * line gives the field its value. */
+/* The value of a plain line; no value if the stanza does not need the line. Throws no_source_error if it needs one, but
+ * no line can give the field its value. */
 std::optional<std::string> plain_text(const stanza_line &line, const stanza_record &from);
 
-/* The names of the bits, as a line of properties has them. Throws no_source_error for a bit without a name. */
+/* The names of the bits, as they are written in a Properties line. Throws no_source_error for a bit without a name. */
 std::string properties_text(std::uint32_t bits, std::span<const props_t> known, const std::string &place);
 
-/* A field whose lines are written in a way of their own. */
+/* A field for whose lines there is a special function. */
 template <class Writer> struct own_line {
     std::size_t offset; /* of the field in the record */
     void (Writer::*write)();
 };
 
-/* Writes a line that no writer of its own writes. */
+/* Writes a line for which there is no special function. */
 void write_plain_line(source_writer &out, const stanza_line &line, const stanza_record &from);
 
-/* Writes lines in their order. Writer has out, from and own_lines(). One function that writes the lines of several
+/* Writes lines in their order. Writer must have out, from and own_lines(). A function that writes the lines of several
  * fields is called once, for the first of them. */
 template <class Writer> void write_lines(Writer &writer, std::span<const stanza_line> lines) {
     constexpr auto own = Writer::own_lines();

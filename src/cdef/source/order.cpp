@@ -40,7 +40,7 @@ std::vector<traced_step> inputs_of(const cdb::resource_class &c) {
     return inputs;
 }
 
-/* The next record of the table whose next variety list comes first; nothing when all are done. */
+/* The next record, from the table whose next variety list comes first; no value when all are done. */
 std::optional<traced_step> next_record(const std::array<std::vector<traces>, RECORD_TABLES> &records,
                                        const std::array<std::size_t, RECORD_TABLES> &done) {
     std::optional<traced_step> next;
@@ -86,8 +86,8 @@ bool is_late(const cdb::resource_class &c, const step &s) {
     return false;
 }
 
-/* An attribute whose run ends the file comes last. It can if nothing of its kind follows it: all others are completed
- * without regard to it. */
+/* An attribute whose run ends the file comes last. This is possible if no attribute of its kind follows it, because the
+ * completion of other kinds does not depend on it. */
 void put_last(class_plan &plan) {
     auto late =
         std::find_if(plan.order.begin(), plan.order.end(), [&](const step &s) { return is_late(plan.view, s); });

@@ -6,7 +6,7 @@
 
 namespace cdef::source {
 
-/* What a stanza left first. */
+/* The first traces that a stanza left in the database. */
 struct traces {
     std::uint32_t variety_list; /* offset; of a record */
     std::uint32_t name;         /* offset in the strings */
@@ -23,13 +23,13 @@ struct traced_step {
 std::vector<step> order_of(const std::array<std::vector<traces>, RECORD_TABLES> &records,
                            std::vector<traced_step> inputs);
 
-/* Sets order and ends_in_run of a plan: the order of the source that the database was made from, as far as it shows.
- * The order matters little to a reader, but much to a Range, and for the same bytes. */
+/* Sets order and ends_in_run of a plan: the order in the source that the database was made from, as far as the database
+ * shows it. The order matters little to a reader, but it matters for a Range, and for getting the same bytes. */
 void plan_order(class_plan &plan);
 
-/* Puts an ordinary stanza between an attribute of structured data, or its run, and a run for the class, because the
- * compiler must not take the one for the other: the map, if its place is still open (map_before); otherwise the class's
- * own, which the run then follows. Call it when the order is final. */
+/* Puts an ordinary stanza between an attribute of structured data, or its run, and a run for the class, so that the
+ * compiler does not confuse the two: the map, if its place is still open (map_before); otherwise the class's own
+ * stanza, which the run then follows. Call it when the order is final. */
 void separate_runs(class_plan &plan);
 
 } // namespace cdef::source

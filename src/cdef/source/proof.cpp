@@ -1,4 +1,4 @@
-/* proof.cpp: the proof that a source gives the database that it was made from. */
+/* proof.cpp: proves that a source gives the database that it was made from. */
 
 #include "cdef/source/proof.h"
 
@@ -53,7 +53,7 @@ std::vector<std::byte> image_of(stepwise_compiler &compiler, std::string_view te
     return compiler.image();
 }
 
-/* A failure's details may belong to the compiler, so they are read while there is one. */
+/* The details of a failure may belong to the compiler, so they are read while it exists. */
 std::vector<std::byte> compiled(std::string_view text, const std::string &output) {
     no_observer observer;
     auto compiler = std::make_unique<stepwise_compiler>("source", output.c_str(), observer);

@@ -1,4 +1,4 @@
-/* range.cpp: which dynamic attributes get a Range line. */
+/* range.cpp: decides which dynamic attributes get a Range line. */
 
 #include "cdef/source/range.h"
 
@@ -15,7 +15,7 @@ namespace {
 constexpr std::size_t BOUNDS = 3;
 
 struct state {
-    bool given = false; /* a Range was, and no completion has cleared the mark */
+    bool given = false; /* a Range was given, and no completion has cleared the mark */
     bounds of_class = bounds::untouched;
     bounds of_resource = bounds::untouched;
 
@@ -26,11 +26,11 @@ struct state {
 };
 constexpr std::size_t STATES = 2 * BOUNDS * BOUNDS;
 
-/* The line that an attribute gets. A useless one gives no bounds, but counts as given. */
+/* The line that an attribute gets. A useless line gives no bounds, but sets the mark. */
 enum class given_line : std::uint8_t { none, good, useless };
 constexpr const char *USELESS_VALUE = "0,0";
 
-/* One more stanza on a way through all of them. */
+/* A step on a path through all stanzas: one more stanza. */
 struct move {
     std::uint32_t before;     /* in the planner's moves */
     std::uint32_t rsrc_class; /* its position */
@@ -51,7 +51,7 @@ struct way {
     }
 };
 
-/* The cheapest way to each state. */
+/* The cheapest path to each state. */
 class ways {
 public:
     void keep(const way &w) {
@@ -105,7 +105,7 @@ private:
     std::vector<move> moves = {{}};
 };
 
-/* The ways on which an open attribute gets its bounds. */
+/* How an open attribute can get its bounds. */
 ways completed(const ways &all, const range &r, bounds state::*held, bool cut_short) {
     ways right;
     for (way w : all) {
@@ -141,12 +141,12 @@ const range &range_of(const dynamic_attributes &attrs, const move &m) {
     return (m.from == table::dynamic_class_attributes ? attrs.of_class : attrs.of_resource)[m.index];
 }
 
-/* Whose bounds a line gives. */
+/* The attribute whose bounds a line gives. */
 const range &target_of(const dynamic_attributes &attrs, const move &m) {
     return m.elsewhere ? attrs.of_resource[m.target] : range_of(attrs, m);
 }
 
-/* Adds moves with a line, a useless one too: it sets the mark. */
+/* Adds moves with a line. A useless line is tried too, because it sets the mark. */
 void planner::add_lines(ways &to, const way &from, move m, const dynamic_attributes &attrs) {
     constexpr unsigned GOOD = 1, MISPLACED = 10, USELESS = 100;
     bounds before = m.elsewhere ? from.at.of_resource : bounds::untouched;
@@ -183,7 +183,7 @@ void planner::begin(ways &to, const ways &from, std::uint32_t c, table kind, pla
     }
 }
 
-/* The ways through a class with its attributes in their order. */
+/* The paths through a class with its attributes in their order. */
 ways planner::end_in_order(std::uint32_t c) {
     ways all = now;
     place at = {0, 0};
@@ -196,7 +196,7 @@ ways planner::end_in_order(std::uint32_t c) {
     return all;
 }
 
-/* Whether a kind has an attribute left that may come now. */
+/* True if a kind has an attribute left that may come now. */
 bool may_begin(const dynamic_attributes &attrs, table kind, place at) {
     bool is_class = kind == table::dynamic_class_attributes;
     std::size_t of_class = attrs.of_class.size() - at.of_class;
@@ -206,7 +206,7 @@ bool may_begin(const dynamic_attributes &attrs, table kind, place at) {
     return left > 0 && !(attrs.has_to_end == kind && left == 1 && others > 0);
 }
 
-/* All ways through a class, by how many of each kind have begun. */
+/* All paths through a class, by how many attributes of each kind have begun. */
 ways planner::end_in_any_order(std::uint32_t c) {
     const dynamic_attributes &attrs = classes[c];
     std::size_t width = attrs.of_resource.size();
@@ -240,7 +240,7 @@ bool planner::plan_class(std::uint32_t c) {
     return now.best().is_open();
 }
 
-/* The lines of the moves on a way, and the order of the moves. */
+/* The lines of the moves on a path, and the order of the moves. */
 std::vector<range_lines> planner::lines_on(const way &w) const {
     std::vector<range_lines> lines;
     for (const dynamic_attributes &attrs : classes)

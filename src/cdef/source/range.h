@@ -1,4 +1,4 @@
-/* range.h: which dynamic attributes get a Range line.
+/* range.h: decides which dynamic attributes get a Range line.
  *
  * Both dynamic kinds share one mark "a Range was given", which the completion of either clears, and a class attribute's
  * Range goes to a resource attribute that is still open. So a line may take effect elsewhere, or an attribute without
@@ -31,7 +31,7 @@ struct range_lines {
     std::vector<table> order;
 };
 
-/* Lines that leave every attribute with its bounds, by class; nothing if there are none. */
+/* Range lines that give every attribute its bounds, by class; no value if there are no such lines. */
 std::optional<std::vector<range_lines>> find_range_lines(const std::vector<dynamic_attributes> &classes);
 
 /* Sets the Range lines of all dynamic attributes, and their order. Throws no_source_error if there are none. */

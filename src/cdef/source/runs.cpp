@@ -1,4 +1,4 @@
-/* runs.cpp: what the definition and the value of a structure tell about the run of SD stanzas that they came from. */
+/* runs.cpp: what the definition and the value of a structure show about the run of SD stanzas that they came from. */
 
 #include "cdef/source/runs.h"
 

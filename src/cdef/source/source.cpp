@@ -17,7 +17,7 @@ namespace cdef {
 
 namespace {
 
-/* A source holds texts as they are. A terminal would act on some of their characters. */
+/* A source contains texts unchanged. A terminal would act on some of their characters. */
 bool is_harmless(std::string_view text) {
     while (!text.empty()) {
         bool is_blank = text.front() == '\n' || text.front() == '\t';

@@ -18,7 +18,7 @@ namespace {
 /* The runs of SD stanzas that belong to a record. */
 struct run_names {
     std::string_view run;       /* an attribute's structure; an action's input */
-    std::string_view other_run; /* may come before it: one that it replaces; an action's response */
+    std::string_view other_run; /* an earlier run that it replaces; or an action's response */
 };
 
 constexpr run_names runs_of(table t) {
@@ -28,7 +28,7 @@ constexpr run_names runs_of(table t) {
                          : run_names{"PAttrSDDefinition", "DAttrSDDefinition"};
 }
 
-/* Of a completed persistent attribute the compiler adds InvalForDefine if nothing says otherwise. */
+/* The compiler adds InvalForDefine to a completed persistent attribute without another such property. */
 std::uint32_t given_properties(std::uint32_t bits, bool cut_short, const std::string &place) {
     if (cut_short || (bits & (REQD_FOR_DEFINE | OPT_FOR_DEFINE)) != 0)
         return bits;
@@ -143,7 +143,7 @@ private:
         write_value_lines(DYNAMIC ? "InitialValue" : "DefaultValue", value);
     }
 
-    /* One line for each element of an array; but an initial value has one line only. */
+    /* One line for each element of an array; an initial value has only one line. */
     void write_value_lines(std::string_view name, const cdb::value &value) {
         if (!cdb::is_array(value.type()))
             return out.line_of_any(name, texts_of(value, false));
@@ -154,7 +154,7 @@ private:
             out.line_of_any(name, texts_of(element, false));
     }
 
-    /* Refuses what only optional lines give: they cannot follow. */
+    /* Refuses values that only optional lines give, because such lines cannot follow. */
     void require_nothing_more(std::span<const stanza_line> optional) {
         bool more = std::any_of(optional.begin(), optional.end(),
                                 [&](const stanza_line &l) { return is_plain(l) && !is_default(l, from); });

@@ -7,11 +7,11 @@
 
 namespace cdef::source {
 
-/* Writes some stanzas of a class, from the step at first up to the one at last, in the order of its plan. What no line
- * says throws no_source_error. */
+/* Writes some stanzas of a class, from the step at first up to the one at last, in the order of its plan. Throws
+ * no_source_error for values that no line can give. */
 void write_steps(source_writer &out, const class_plan &plan, std::size_t first, std::size_t last);
 
-/* Offsets of the fields whose lines these stanzas write in a way of their own; none for any other stanza. */
+/* Offsets of the fields for whose lines these stanzas have special functions; empty for any other stanza. */
 std::vector<std::size_t> own_attribute_fields(stanza_id stanza);
 
 } // namespace cdef::source

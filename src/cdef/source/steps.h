@@ -1,4 +1,4 @@
-/* steps.h: the stanzas of a class as steps, and what is planned of them before any is written. */
+/* steps.h: the stanzas of a class as steps, and the plan that is made before they are written. */
 #ifndef CDGEN_CDEF_SOURCE_STEPS_H
 #define CDGEN_CDEF_SOURCE_STEPS_H
 
@@ -85,7 +85,7 @@ inline constexpr std::array<class_input, 5> class_inputs = {{
     {offsetof(rsrc_class_t, u_rc_reset_input), &rsrc_class_t::u_rc_reset_input},
 }};
 
-/* What has to be known of a dynamic attribute before its stanza is written. */
+/* What must be known about a dynamic attribute before its stanza is written. */
 struct dynamic_plan {
     std::string variable_class; /* empty: none */
     std::string range;          /* the value of a Range line; empty: no line */
@@ -112,20 +112,20 @@ struct class_plan {
     std::size_t count(table of_records) const {
         return view.record().*side_table_of(of_records).count;
     }
-    /* Whether a field of a record leads to what is the record's own. */
+    /* True if a field of a record leads to something that the record owns. */
     bool owns(const step &record, std::size_t field_offset) const {
         const cdb::side_table &t = side_table_of(record.from);
         std::size_t at = (view.record().*t.ref).offset[0] + record.index * t.record->size;
         return owners->is_own(view.side_tables().section, at + field_offset);
     }
-    /* A class that follows in the source ends this one while the last attribute of each kind is still open: it is
-     * written as it is, without the checks and defaults of its completion. */
+    /* A class that follows in the source ends this one while the last attribute of each kind is still open: the
+     * compiler writes that attribute as it is, without the checks and defaults of its completion. */
     bool is_cut_short(const step &s) const {
         return !is_last && s.from < table::class_actions && s.index + 1 == count(s.from);
     }
 };
 
-/* All required lines can be given. Only then may optional ones follow. */
+/* True if all required lines can be given. Only then may optional ones follow. */
 template <class Record> bool is_complete(const cdb::attribute<Record> &attr) {
     return attr.type() != VX_UNKNOWN && !attr.varieties().empty();
 }

@@ -13,7 +13,7 @@ namespace cdef::source {
 
 namespace {
 
-/* Both have as many elements. */
+/* Both must have the same number of elements. */
 bool same_types(const std::vector<vx_data_type_t> &types, const cdb::sd_definition &definition) {
     for (std::size_t i = 0; i < types.size(); ++i)
         if (types[i] != definition[i].type())
@@ -21,7 +21,8 @@ bool same_types(const std::vector<vx_data_type_t> &types, const cdb::sd_definiti
     return true;
 }
 
-/* Structured data have no structured data in them. Those that become a value have a type with a default, each. */
+/* Structured data cannot contain structured data. Elements that become part of a value must have a type with a default.
+ * */
 void require_types(const cdb::sd_definition &definition, bool makes_value, const std::string &place) {
     for (const cdb::sd_element &e : definition) {
         if (cdb::element_type(e.type()) == VX_SD_PTR || (makes_value && !has_default(e.type())))
@@ -91,7 +92,7 @@ void write_indexed_run(source_writer &out, std::string_view stanza, const cdb::s
     }
 }
 
-/* A run that the next one replaced: only the value that it made is left. */
+/* A run that the next one replaced; only its value is left in the database. */
 void write_replaced_run(source_writer &out, const attribute_structure &s, const element_types &value, std::size_t given,
                         const std::string &place) {
     out.comment("The next run replaces this one, but for the value.");
@@ -110,7 +111,7 @@ std::size_t require_indices(std::size_t elements, std::uint16_t highest, const s
     return *given;
 }
 
-/* The value is that of the definition, or of a run just as long that the definition replaced. */
+/* The value comes from the definition's run, or from a run of the same length that it replaced. */
 void write_own_run(source_writer &out, const attribute_structure &s, const element_types &value,
                    const std::string &place) {
     if (!same_types(value.types, s.definition))

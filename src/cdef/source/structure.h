@@ -17,14 +17,14 @@ struct attribute_structure {
     bool ends_file;
 };
 
-/* place: for messages. What no run gives throws no_source_error. */
+/* place: for messages. Throws no_source_error for what no run can give. */
 void write_structure(source_writer &out, const attribute_structure &s, const std::string &place);
 
 /* A run for an action or the class. */
 void write_run(source_writer &out, std::string_view stanza, const cdb::sd_definition &definition,
                const std::string &place);
 
-/* Offsets of the fields whose lines an element's stanza writes in a way of its own. */
+/* Offsets of the fields for whose lines an element's stanza has special functions. */
 std::vector<std::size_t> own_element_fields();
 
 } // namespace cdef::source

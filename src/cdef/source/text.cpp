@@ -15,7 +15,8 @@ namespace {
 
 constexpr std::string_view BLANKS = " \t";
 
-/* Whether the compiler takes the whole line as text: no newline, no comment, nothing at the end that it removes. */
+/* True if the compiler reads the whole line as text: it has no newline, no comment, and nothing at the end that the
+ * compiler removes. */
 bool is_all_text(std::string_view line) {
     bool quoted = false;
     for (std::size_t i = 0; i < line.size(); ++i) {
@@ -41,7 +42,7 @@ bool fits(std::string_view line) {
 
 /* ---- Values ---------------------------------------------------------------------------------------------------- */
 
-/* Decimal, except where that would count as an underflow: the compiler remembers it and refuses later zeros. */
+/* Decimal, except where that would underflow, because the compiler remembers it and refuses later zeros. */
 template <class Float> std::string text_of_real(Float number) {
     if (std::fpclassify(number) != FP_SUBNORMAL)
         return text::shortest(number);
@@ -57,7 +58,7 @@ std::vector<std::string> only(std::string text) {
     return texts;
 }
 
-/* Which characters of a binary's text are written as they are. */
+/* True for characters that are written as they are in a binary's text. */
 enum class plain : std::uint8_t { printable, all };
 
 std::string escaped(std::byte b, plain which, bool in_pair) {

@@ -11,14 +11,14 @@
 
 namespace cdef::source {
 
-/* The line that gives an attribute a value, without its newline; nothing if no line does. */
+/* The line that gives an attribute a value, without its newline; no value if no line can. */
 std::optional<std::string> attribute_line(std::string_view name, std::string_view value);
 
 /* The texts of a value that are worth trying, the best one first; none if it has no text. They all stand for the same
  * value, but one may fit into a line where another does not. in_pair: the text must not contain a comma. */
 std::vector<std::string> texts_of(const cdb::value &value, bool in_pair);
 
-/* Whether the compiler gives this value to an attribute of its type if no line says otherwise. */
+/* True if an attribute of the type has this value without a line for it. */
 bool is_default(const cdb::value &value);
 
 } // namespace cdef::source

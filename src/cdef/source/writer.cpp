@@ -1,4 +1,4 @@
-/* writer.cpp: the text of a source in the making. */
+/* writer.cpp: writes the text of a source. */
 
 #include "cdef/source/writer.h"
 

@@ -1,4 +1,4 @@
-/* writer.h: the text of a source in the making. */
+/* writer.h: writes the text of a source. */
 #ifndef CDGEN_CDEF_SOURCE_WRITER_H
 #define CDGEN_CDEF_SOURCE_WRITER_H
 
@@ -9,19 +9,19 @@
 
 namespace cdef::source {
 
-/* What no line can say throws no_source_error. */
+/* Its functions throw no_source_error for what no line can express. */
 class source_writer {
 public:
-    /* Each line of the text becomes a comment. Lines are not broken: they must be short. */
+    /* Writes each line of the text as a comment. Lines are not wrapped, so they must be short. */
     void comment(std::string_view text);
     void blank_line();
-    /* place: what messages about its lines name. */
+    /* place: named in messages about its lines. */
     void stanza(std::string_view kind, std::string place);
     void line(std::string_view name, std::string_view value);
     void line(std::string_view name, std::int64_t number);
-    /* No line for the number that the compiler gives without one. */
+    /* Writes no line for the number that the field has without one. */
     void optional_line(std::string_view name, std::int64_t number, std::int64_t without);
-    /* Writes the first of several texts for which there is a line. */
+    /* Writes the first of several texts that fits in a line. */
     void line_of_any(std::string_view name, const std::vector<std::string> &values);
 
     std::string text;

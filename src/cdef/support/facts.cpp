@@ -1,4 +1,4 @@
-/* facts.cpp: what fields of databases state. */
+/* facts.cpp: the fields of databases as facts. */
 
 #include "cdef/support/facts.h"
 
@@ -68,8 +68,8 @@ template <class Number> void append_digits(std::string &to, Number number) {
     to.append(digits.data(), std::to_chars(digits.data(), digits.data() + digits.size(), number).ptr);
 }
 
-/* What JSON has no number for becomes text. The number goes through its digits, so that 0.1 of 32 bits does not become
- * 0.10000000149011612. */
+/* Numbers that JSON cannot write become text. The conversion uses the decimal digits, so that 0.1 as a 32-bit number
+ * does not become 0.10000000149011612. */
 template <class Real> void append_real(std::string &to, Real number) {
     std::string digits = text::shortest(number);
     if (!std::isfinite(number))

@@ -1,4 +1,4 @@
-/* facts.h: what fields of databases state, as data that programs take: numbers, names, texts. */
+/* facts.h: the fields of databases as facts: numbers, names and texts. */
 #ifndef CDGEN_CDEF_FACTS_H
 #define CDGEN_CDEF_FACTS_H
 
@@ -15,7 +15,7 @@ namespace cdef::facts {
 
 struct none {};
 
-/* One of our own words: the name of a type, a version, a time. */
+/* A word from this program: the name of a type, a version, a time. */
 struct word {
     std::string text;
 };
@@ -40,7 +40,7 @@ struct bits {
     std::uint32_t number;
 };
 
-/* A number that stands for something with a name; kind is empty if it stands for nothing known. */
+/* A number that refers to something with a name; kind is empty if the number is unknown. */
 struct named {
     std::uint32_t number;
     std::string_view kind;
@@ -56,20 +56,20 @@ struct checksum {
 using fact = std::variant<none, std::int64_t, std::uint64_t, float, double, bits, word, named_bits, any_text, binary,
                           vx_resource_handle_t, named, checksum>;
 
-/* What a number means as far as it can be told from the number alone. */
+/* The meaning of a number, as far as the number alone shows it. */
 fact fact_of(cdb::meaning as, std::uint32_t number);
 
-/* A value that is stored in its cell, or is none. It has no elements. */
+/* A value that is stored in its cell, or no value. It has no elements. */
 fact fact_of(const cdb::value &value);
 
 /* On one line, in ASCII only. docs/dump.md says which fact has which form. */
 void append_json(std::string &to, const fact &f);
 
-/* The name of one of the bits; empty if it has none. The text is never freed. */
+/* The name of one of the bits; empty if it has no name. The text is never freed. */
 std::string_view name_of_bit(cdb::meaning as, std::uint32_t bit);
 
-/* Passes the names of the bits to take(std::string_view), the lowest bit first. What has no name follows as one number
- * in hexadecimal. */
+/* Passes the names of the bits to take(std::string_view), the lowest bit first. Bits without a name follow as one
+ * hexadecimal number. */
 template <class Take> void take_names(const named_bits &bits, Take take) {
     std::uint32_t unknown = 0;
     for (std::uint32_t rest = bits.set; rest != 0; rest &= rest - 1) {

@@ -8,7 +8,7 @@
 
 namespace cdef {
 
-/* File names are part of messages, and a name may hold anything. */
+/* File names are part of messages, and a name may contain any characters. */
 void print_error(const std::string &message) {
     std::fprintf(stderr, "cdef: %s\n", text::escaped(message).c_str());
 }

@@ -1,4 +1,4 @@
-/* failure.h: how a subcommand fails, and what its exit status says. */
+/* failure.h: how a subcommand fails, and its exit status. */
 #ifndef CDGEN_CDEF_FAILURE_H
 #define CDGEN_CDEF_FAILURE_H
 

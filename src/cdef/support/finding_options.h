@@ -17,12 +17,12 @@ class App;
 
 namespace cdef {
 
-/* Which findings a source may have. */
+/* The options that decide which findings a source may have. */
 struct finding_rules {
     check::warning_set wanted;
     bool warnings_count = false; /* as errors do */
 
-    /* Whether a source with so many findings is good. */
+    /* True if a source with this many findings passes. */
     bool pass(const check::totals &count) const {
         return count.errors == 0 && (count.warnings == 0 || !warnings_count);
     }
@@ -37,11 +37,11 @@ struct finding_options {
     std::string colour = "auto";
     project_options project;
 
-    /* What the options say, and where they say nothing, the project file. All warnings are wanted but the unwanted
-     * ones; a name that is given both ways is wanted. */
+    /* The settings from the options or, where an option is missing, from the project file. All warnings are wanted
+     * except the unwanted ones; a name that is in both lists is wanted. */
     finding_rules rules(const config::settings &settings) const;
-    /* What writes findings in the form: text to standard error, other forms to standard output. more: rules that
-     * findings may break besides those of sources. */
+    /* The object that writes findings in the chosen form: text to standard error, other forms to standard output. more:
+     * rules that findings may break besides those of sources. */
     std::unique_ptr<report::writer> writer(std::vector<report::rule> more = {}) const;
     /* Reports a source that could not be read. why: a message that names the source. */
     void fail_source(report::writer &to, const std::string &why) const;
@@ -52,7 +52,7 @@ void add_report_options(CLI::App &command, finding_options &options);
 /* and --werror, --no-werror, --config and --no-config. */
 void add_project_rules(CLI::App &command, finding_options &options);
 
-/* Adds all of these, and --warn and --no-warn. The options must stay as long as the command. */
+/* Adds all of these, and --warn and --no-warn. The options must outlive the command. */
 void add_finding_options(CLI::App &command, finding_options &options);
 
 /* Throws check::cannot_check for a database, and names the subcommand that checks it. */

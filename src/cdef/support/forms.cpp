@@ -1,4 +1,4 @@
-/* forms.cpp: the option that chooses the form of what a subcommand shows. */
+/* forms.cpp: the option for the output format of a subcommand. */
 
 #include "cdef/support/forms.h"
 

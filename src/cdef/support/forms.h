@@ -1,4 +1,4 @@
-/* forms.h: the option that chooses the form of what a subcommand shows. It is spelled alike in all of them. */
+/* forms.h: the option for the output format, which is the same in all subcommands. */
 #ifndef CDGEN_CDEF_FORMS_H
 #define CDGEN_CDEF_FORMS_H
 
@@ -11,8 +11,8 @@ class App;
 
 namespace cdef {
 
-/* Adds --format, which takes one of the forms, the first of which is the default; and --json, and --hex where there is
- * that form, which are short for it. The chosen form is stored in `form`, which must stay as long as the command. */
+/* Adds --format, which takes one of the forms, the first of which is the default; also --json, and --hex if there is
+ * that form, as short names. The chosen form is stored in `form`, which must outlive the command. */
 void add_forms(CLI::App &command, std::string &form, const std::vector<std::string> &forms, const std::string &help);
 
 /* Adds --color, which is stored in `colour`; wants_colour() says what it means. */

@@ -19,7 +19,7 @@ namespace cdef {
 
 namespace {
 
-/* Errors that do not keep a database from being shown. */
+/* Errors with which a database can still be shown. */
 constexpr std::array tolerated = {cdb::CODE_CHECKSUM, cdb::CODE_RESERVED};
 
 bool tolerable(const cdb::finding &finding) {
@@ -27,7 +27,7 @@ bool tolerable(const cdb::finding &finding) {
            std::find(tolerated.begin(), tolerated.end(), finding.broken->code) != tolerated.end();
 }
 
-/* From the descriptor itself: it may be a pipe, or partly read. */
+/* Reads from the descriptor itself, because it may be a pipe or partly read. */
 std::vector<std::byte> standard_input(std::error_code &error) {
     constexpr std::size_t STEP = 65536;
     std::vector<std::byte> contents;
@@ -76,7 +76,7 @@ struct open_file {
     int fd;
 };
 
-/* The first bytes from where a regular file will be read; none of any other file. */
+/* The next bytes of a regular file, without moving its position; no bytes for any other file. */
 std::vector<std::byte> beginning_of(int fd) {
     constexpr std::size_t ENOUGH = sizeof(orb_cdb_header_t);
     struct stat st = {};
@@ -114,7 +114,7 @@ std::optional<cdb::finding> readability::first_of(std::string_view code) const {
     return found == errors.end() ? std::nullopt : std::optional(*found);
 }
 
-/* There may be millions of findings, of which few matter. */
+/* There may be millions of findings, of which only a few matter. */
 readability require_readable(const input &in) {
     std::vector<std::size_t> strays;
     std::vector<cdb::finding> errors;

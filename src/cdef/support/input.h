@@ -26,28 +26,28 @@ struct input {
     cdb::database db;
 };
 
-/* Whether a file is a text rather than a database, however damaged: it has no format word, and no byte of its beginning
+/* True if a file is a text and not a database, even a damaged one: it has no format word, and no byte of its beginning
  * is zero. */
 bool is_text(const std::vector<std::byte> &contents);
 
-/* Whether a file has the format word of a database. False for what cannot be read at a place, such as a pipe: nothing
- * is taken from it. "-" is standard input. */
+/* True if a file has the format word of a database. False for files without positions, such as pipes, from which
+ * nothing is read. "-" is standard input. */
 bool is_database(const std::string &path);
 
-/* What verification says of a database that can be read. */
+/* The result of verifying a readable database. */
 struct readability {
     cdb::ownership owners;
-    std::vector<cdb::finding> errors; /* the first of each of the rules that it breaks all the same */
+    std::vector<cdb::finding> errors; /* the first finding of each rule that it breaks nevertheless */
 
     std::optional<cdb::finding> first_of(std::string_view code) const;
 };
 
-/* Throws failure unless the database's records and values can be relied on: its only errors may be a wrong checksum
- * and filling that is not zero. */
+/* Throws failure if the records and values of the database are not reliable. Only a wrong checksum and padding that is
+ * not zero are accepted. */
 readability require_readable(const input &in);
 
-/* The same, and reports on standard error which of these two errors it has, each once: for subcommands whose output
- * does not show it. */
+/* The same, and reports on standard error which of these two errors it has, each once. For subcommands whose output
+ * does not show them. */
 readability require_readable_aloud(const input &in);
 
 } // namespace cdef

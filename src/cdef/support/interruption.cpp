@@ -1,4 +1,4 @@
-/* interruption.cpp: holds signals back while work is done that they must not cut in two. */
+/* interruption.cpp: holds signals back during work that must not be interrupted. */
 
 #include "cdef/support/interruption.h"
 
@@ -10,7 +10,7 @@ namespace cdef {
 
 namespace {
 
-/* Those that end a program and do not say that it is defective, unless they are ignored, as under nohup. */
+/* The signals that end a program and do not report a defect of it, except those that are ignored, as under nohup. */
 sigset_t ending_signals() {
     sigset_t set;
     sigemptyset(&set);

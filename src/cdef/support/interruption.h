@@ -1,4 +1,4 @@
-/* interruption.h: signals that end the program, and work that they must not cut in two. */
+/* interruption.h: holds back signals that end the program during work that must not be interrupted. */
 #ifndef CDGEN_CDEF_INTERRUPTION_H
 #define CDGEN_CDEF_INTERRUPTION_H
 
@@ -7,8 +7,8 @@
 
 namespace cdef {
 
-/* Until the end of the block, a signal that would end the program waits. The work has to be short: it must not wait for
- * other programs. */
+/* Until the end of the block, a signal that would end the program is held back. The work must be short and must not
+ * wait for other programs. */
 class uninterrupted {
 public:
     uninterrupted();
@@ -20,9 +20,9 @@ private:
     sigset_t before;
 };
 
-/* Makes the same hold for several threads: those that are started while it exists. A signal is then taken by a thread
- * of its own, which lets uninterrupted work come to its end, and no more begin, before the program ends by the signal.
- * (Otherwise, the signal would be taken by a thread that happens not to hold it back.) */
+/* Does the same for several threads: those that are started while it exists. A separate thread then receives the
+ * signals. It waits until all uninterrupted work has ended, lets no more begin, and then ends the program with the
+ * signal. (Otherwise the signal would be delivered to a thread that happens not to hold it back.) */
 class interruption_watch {
 public:
     interruption_watch();

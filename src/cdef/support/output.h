@@ -15,7 +15,7 @@ void print(std::string_view text);
  * call dumb, and NO_COLOR is not set or empty. */
 bool wants_colour(std::string_view when, int descriptor);
 
-/* Text on its way to standard output, so that a long listing need not be in memory as a whole. */
+/* Writes text to standard output in portions, so that a long listing need not be in memory as a whole. */
 class output {
 public:
     std::string text;

@@ -20,7 +20,7 @@ struct project_options {
     std::optional<std::string> file; /* this one is read for all sources */
 };
 
-/* Adds --config and --no-config. The options must stay as long as the command. */
+/* Adds --config and --no-config. The options must outlive the command. */
 void add_project_options(CLI::App &command, project_options &options);
 
 /* Reads each project file once. */
@@ -28,8 +28,8 @@ class project_files {
 public:
     explicit project_files(const project_options &wanted) : options(wanted) {}
 
-    /* The settings for a source. They stay as long as this object. If the project file has errors, reports all but the
-     * last one on standard error, and throws failure with that. */
+    /* The settings for a source. They are valid as long as this object. If the project file has errors, reports all but
+     * the last one on standard error, and throws failure with that. */
     const config::settings &of(const std::string &source);
 
 private:

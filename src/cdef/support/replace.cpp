@@ -46,7 +46,7 @@ private:
     int fd;
 };
 
-/* A new file beside another one. It is removed unless it takes the other's place. */
+/* A new file beside another one. It is removed unless it replaces the other. */
 class file_beside {
 public:
     explicit file_beside(const std::string &target) : path(target + ".XXXXXX"), out(mkostemp(path.data(), O_CLOEXEC)) {
@@ -60,7 +60,7 @@ public:
             unlink(path.c_str());
     }
 
-    /* Its owner first, since that may change the mode. */
+    /* Sets the owner first, because that may change the mode. */
     void belong_as(const struct stat &other) {
         constexpr mode_t MODE_BITS = 07777;
         bool owned = fchown(out.get(), other.st_uid, other.st_gid) == 0;
@@ -85,7 +85,7 @@ public:
     }
 
 private:
-    std::string path; /* empty: it has taken its place */
+    std::string path; /* empty: it has replaced the other */
     descriptor out;
 };
 
@@ -105,7 +105,7 @@ std::string all_of(int fd, const std::string &name) {
     }
 }
 
-/* What a path leads to. */
+/* The file that a path leads to. */
 std::string target_of(const std::string &path) {
     std::unique_ptr<char, decltype(&std::free)> resolved(realpath(path.c_str(), nullptr), &std::free);
     if (resolved == nullptr)

@@ -10,9 +10,10 @@ namespace cdef {
 /* All of a file; "-" is standard input. Throws failure. */
 std::string text_of_file(const std::string &path);
 
-/* Replaces a file at once: whoever opens it finds all of the old or all of the new text, and on failure the old. A
- * symbolic link stays, and what it leads to is replaced. The file keeps its mode, and its owner if that is possible.
- * before: the text that it was read with; a file that has another one by now is not replaced. Throws failure. */
+/* Replaces a file in one step: programs that open it find either the complete old text or the complete new one, and
+ * after a failure the old one. If the path is a symbolic link, the file that it leads to is replaced. The file keeps
+ * its mode, and its owner if that is possible. before: the text that was read from it; if the file has another text by
+ * now, it is not replaced. Throws failure. */
 void replace_file(const std::string &path, std::string_view before, std::string_view after);
 
 } // namespace cdef

@@ -24,12 +24,12 @@ namespace cdef {
 namespace {
 
 constexpr std::string_view MARK = ".cdef-new";
-constexpr int MOST_LINKS = 40;   /* as many as Linux follows */
-constexpr int MOST_TRIES = 1000; /* to make a file that other programs make and remove */
+constexpr int MOST_LINKS = 40;   /* as many links as Linux follows */
+constexpr int MOST_TRIES = 1000; /* attempts to make a file that other programs make and remove */
 constexpr mode_t NEW_MODE = 0644;
 constexpr mode_t PRIVATE_MODE = 0600; /* until the contents are whole */
 
-/* The end of a step: its message is completed by what knows the path. */
+/* Thrown when a step fails; the caller, which knows the path, completes the message. */
 struct step_failed {
     int error;
 };
@@ -58,7 +58,7 @@ public:
     int get() const {
         return fd;
     }
-    /* The last chance of a file system to say that it could not write. */
+    /* Closing is the last chance of a file system to report that it could not write. */
     void close() {
         require(::close(std::exchange(fd, -1)) == 0);
     }
@@ -71,14 +71,14 @@ bool is_same_file(const struct stat &a, const struct stat &b) {
     return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
 }
 
-/* Whether a name leads to an open file. */
+/* True if a name leads to an open file. */
 bool has_name(int fd, const std::string &name) {
     struct stat file = {}, named = {};
     return fstat(fd, &file) == 0 && lstat(name.c_str(), &named) == 0 && is_same_file(file, named);
 }
 
-/* False if another program has locked the file; only without waiting. Where there are no locks, every file is taken as
- * locked. */
+/* Locks the file. Without waiting, returns false if another program has locked it. On a file system without locks,
+ * every file counts as locked. */
 bool lock(int fd, bool wait) {
     int how = LOCK_EX | (wait ? 0 : LOCK_NB);
     int done = 0;
@@ -88,7 +88,8 @@ bool lock(int fd, bool wait) {
     return done == 0 || errno != EWOULDBLOCK;
 }
 
-/* Removes a temporary file that no program has locked; waits for one that has. Nothing if it is gone. */
+/* Removes a temporary file that no program has locked. If a program has locked it, waits for that. Does nothing if the
+ * file is gone. */
 void clear_away(const std::string &name, bool wait) {
     descriptor old(open(name.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC));
     if (!old.is_open()) {
@@ -123,7 +124,7 @@ std::string directory_of(const std::string &path) {
 /* The temporary file while it exists; removes itself unless it is renamed. */
 class temporary_file {
 public:
-    /* Not made if there is one already. */
+    /* Does not make the file if it exists already. */
     temporary_file(std::string called, mode_t mode)
         : name(std::move(called)), file(open(name.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, mode)) {
         require(file.is_open() || errno == EEXIST);
@@ -135,7 +136,7 @@ public:
             unlink(name.c_str());
     }
 
-    /* False if there was one, or if another program takes this one for what a killed one has left, and removes it. */
+    /* False if the file existed, or if another program mistakes it for that of a killed program and removes it. */
     bool is_made() {
         is_locked = file.is_open() && lock(file.get(), false);
         return is_locked && is_mine();
@@ -159,7 +160,7 @@ private:
     bool is_mine() const {
         return has_name(file.get(), name);
     }
-    /* Owner first: changing it may clear bits of the mode. Not everybody may. */
+    /* Sets the owner first, because changing it may clear bits of the mode. Not every user may change it. */
     void adopt(const struct stat &old) const {
         constexpr mode_t MODE = 07777;
         struct stat mine = {};
@@ -175,7 +176,7 @@ private:
     bool is_locked = false; /* only then may the name be removed, or given to another file */
 };
 
-/* What is to be replaced, if it exists. */
+/* The file that will be replaced, if it exists. */
 std::optional<struct stat> existing(const std::string &target) {
     struct stat old = {};
     if (stat(target.c_str(), &old) != 0) {
@@ -217,7 +218,7 @@ void replace_target(const std::string &target, std::string_view contents, bool s
         sync_directory(target);
 }
 
-/* Enough to tell names apart that begin alike. */
+/* Enough to distinguish names with the same beginning. */
 std::uint64_t hash_of(std::string_view text) {
     std::uint64_t hash = 14695981039346656037U; /* FNV-1a */
     for (char c : text)
@@ -232,7 +233,8 @@ std::string target_of(const std::string &path) {
     for (int links = 0; links < MOST_LINKS; ++links) {
         std::array<char, PATH_MAX> text;
         ssize_t length = readlink(target.c_str(), text.data(), text.size());
-        if (length < 0 || static_cast<size_t>(length) == text.size()) /* no link; other errors show when it is opened */
+        if (length < 0 || static_cast<size_t>(length) == text.size()) /* not a link; other errors are reported when it
+                                                                       * is opened */
             return target;
         std::string_view leads_to(text.data(), static_cast<size_t>(length));
         target = (leads_to.starts_with('/') ? "" : directory_of(target)).append(leads_to);
@@ -253,7 +255,7 @@ std::string temporary_of(const std::string &target) {
 void remove_remains(const std::string &target) {
     try {
         clear_away(temporary_of(target), false);
-    } catch (const step_failed &) { /* it shows when the name is needed */
+    } catch (const step_failed &) { /* an error is reported when the name is needed */
     }
 }
 

@@ -1,6 +1,6 @@
 /* replacement.h: puts new contents in the place of a file. They are written to a temporary file beside it, which is
- * then renamed over it: who opens the file sees the old contents or the new ones, and who has mapped it keeps the old
- * ones. If anything fails, the file is as it was. */
+ * then renamed over it: programs that open the file see either the old or the new contents, and programs that have
+ * mapped it keep the old ones. If anything fails, the file does not change. */
 #ifndef CDGEN_CDEF_REPLACEMENT_H
 #define CDGEN_CDEF_REPLACEMENT_H
 
@@ -9,15 +9,15 @@
 
 namespace cdef {
 
-/* The file that a path leads to through symbolic links; it need not exist. Throws failure if there is no end of
- * them. */
+/* The file that a path leads to through symbolic links; it need not exist. Throws failure if there are too many links.
+ * */
 std::string target_of(const std::string &path);
 
 /* The temporary file for a target: .NAME.cdef-new in its directory; a name that would become too long is cut, and has a
  * hash at its end. */
 std::string temporary_of(const std::string &target);
 
-/* Removes the temporary file that a killed program has left for a target; not one that is in use. */
+/* Removes the temporary file that a killed program has left for a target, but not one that is in use. */
 void remove_remains(const std::string &target);
 
 struct replacement_options {
@@ -25,7 +25,8 @@ struct replacement_options {
 };
 
 /* Replaces the file that a path leads to, or makes it. It keeps its mode and, if this user may give files away, its
- * owner. Of two replacements at once, the second one waits for the first. Throws failure, which names the path. */
+ * owner. If two programs replace the file at once, the second waits for the first. Throws failure, which names the
+ * path. */
 void replace_file(const std::string &path, std::string_view contents, const replacement_options &options = {});
 
 } // namespace cdef

@@ -1,4 +1,4 @@
-/* sources.cpp: the sources that operands stand for. */
+/* sources.cpp: finds the sources that operands name. */
 
 #include "cdef/support/sources.h"
 

@@ -1,4 +1,4 @@
-/* status.h: what the exit statuses of the subcommands mean. docs/cdef.md has the same table. */
+/* status.h: the meanings of the subcommands' exit statuses. docs/cdef.md has the same table. */
 #ifndef CDGEN_CDEF_STATUS_H
 #define CDGEN_CDEF_STATUS_H
 
@@ -15,7 +15,7 @@ constexpr int FAILED = 2;
 struct meanings {
     std::string_view subcommand;
     std::string_view ok;
-    std::string_view found; /* empty: does not occur */
+    std::string_view found; /* empty: the status does not occur */
     std::string_view failed;
 };
 

@@ -25,16 +25,16 @@ std::size_t consequences_of(const std::vector<cdb::diagnosed> &all, std::size_t 
 /* One line, as compilers write them, with a newline. file: its name, with any bytes. */
 std::string line_of(const std::string &file, const cdb::finding &f);
 
-/* What was found, or expected, as JSON: a number, whether it is shown in decimal or in hexadecimal, or a text. */
+/* What was found or expected, as JSON: a number, even if the text shows it in hexadecimal, or a string. */
 std::string json_value(const std::string &shown);
 
-/* Without warnings. What only a warning explains explains itself. */
+/* The findings without warnings. A finding that only a warning explains becomes a cause. */
 std::vector<cdb::diagnosed> errors_of(std::vector<cdb::diagnosed> &&all);
 
 /* One line that says how many findings follow from the one before it, with a newline. */
 std::string note_of(const std::string &file, std::size_t consequences);
 
-/* One line that says why nothing is said of what follows from what, with a newline. */
+/* One line that says why causes were not looked for, with a newline. */
 std::string note_of_many(const std::string &file, std::size_t count);
 
 /* Adds a finding to a list. at: its position there. */

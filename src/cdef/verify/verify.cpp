@@ -21,7 +21,7 @@ namespace {
 struct verify_options {
     std::vector<std::string> files;
     std::string form;
-    bool warnings_count = false; /* a database with warnings fails as one with errors does */
+    bool warnings_count = false; /* warnings count as errors */
     bool quiet = false;          /* warnings are not shown */
     bool shows_all = false;      /* consequences are shown too */
 };
@@ -38,7 +38,7 @@ std::unique_ptr<verify::form> form_of(const verify_options &options) {
     return verify::text_form(options.shows_all);
 }
 
-constexpr std::size_t MOST_DIAGNOSED = 10000; /* findings of which the causes are looked for */
+constexpr std::size_t MOST_DIAGNOSED = 10000; /* the most findings for which causes are looked for */
 
 bool is_shown(const cdb::finding &found, const verify_options &options) {
     return !options.quiet || found.broken->level == cdb::severity::error;

@@ -134,7 +134,7 @@ struct totals {
 
 /* Receives each finding, when about a thousand later ones have been found. Findings are in the order of their lines,
  * and the errors of a line come before its warnings. A finding about a much earlier line is passed on when it is found.
- * */
+ */
 using sink = std::function<void(finding &&)>;
 
 /* The source cannot be read, or memory ran out. The text names the source. */

@@ -71,7 +71,7 @@ void recovery::settle_order() {
 }
 
 /* An attribute that the incomplete stanza before this one already has, or cannot have, is not one of its missing lines.
- * */
+ */
 void recovery::settle_split() {
     if (known.split.kind == NO_KIND || see.attr().dup_allowed != 0)
         return;

@@ -74,7 +74,7 @@ void recovery::take_header(const attr_text &text, bool guessed) {
 }
 
 /* True if the next index of the run is unknown, because the element before it gave no index, which has been reported.
- * */
+ */
 bool recovery::loses_index(int next_kind) const {
     if (next_kind != known.run.kind || !compiler.run_is_open())
         return false;

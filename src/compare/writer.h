@@ -47,7 +47,7 @@ public:
     void write_value(const owned_value &value);
     void write_fact(const fact &f);
     /* Writes the name of a record, or what identifies an entry of a list. Writes nothing for a record without a name.
-     * */
+     */
     void write_name(const node &n);
 
 private:

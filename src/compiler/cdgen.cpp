@@ -23,7 +23,7 @@ void parse_options(cdgen &cx, int argc, char **argv) {
         case 'd':
             cx.options.debugLevel =
                 atoi(optarg); /* 0 for text that is not a number; does not affect the errno of conversions in the source
-                               * */
+                               */
             break;
         case 's':
             cx.options.swap_endianness = 1;

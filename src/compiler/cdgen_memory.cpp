@@ -17,7 +17,7 @@ namespace {
 
 constexpr bool PLENTIFUL = sizeof(size_t) > sizeof(uint32_t); /* address space */
 constexpr uint64_t WHOLE_TABLE = uint64_t{1} << 32;           /* in bytes: the largest size that a table's offsets allow
-                                                               * */
+                                                               */
 
 bool is_limited() {
     struct rlimit limit = {};

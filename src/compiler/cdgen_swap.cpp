@@ -316,7 +316,7 @@ void swap_section_of(const cdb_dsect_anchor_t &anchor, const swap_section &secti
 }
 
 /* Sets the words that only look like references to "none" while the image is walked. Returns their previous contents.
- * */
+ */
 std::vector<vx_uint32_t> hide_strays(char *image, std::span<const size_t> places) {
     std::vector<vx_uint32_t> words;
     for (size_t place : places) {

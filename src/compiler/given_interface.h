@@ -27,7 +27,7 @@ const char *is_attr_SD(int table_id);
 sd_type_t SD_stanza_type(int table_id);
 
 /* The table for the elements of the kind's stanzas; null if it has none. Part of the fixed interface; nothing calls it.
- * */
+ */
 tbl *sc_sd_tbl(cdgen &cx, const srtable_ctrl &kind);
 
 /* The result of data_type_named for a name; VX_UNKNOWN for null. Part of the fixed interface; nothing calls it. */

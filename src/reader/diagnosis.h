@@ -10,7 +10,7 @@ namespace cdb {
 inline constexpr std::string_view CODE_CONTRADICTING = "CDB108";
 
 /* The rule of that code. It is not among rules(), because verify() cannot find such a number, only the contradictions.
- * */
+ */
 const rule &contradicting_rule();
 
 /* A finding, and which one it is a consequence of. */

@@ -1,5 +1,5 @@
 /* region_map.h: the meaning of each stretch of a file, collected in any order and passed on in the order of the file.
- * */
+ */
 #ifndef CDGEN_READER_REGION_MAP_H
 #define CDGEN_READER_REGION_MAP_H
 

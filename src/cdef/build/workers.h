@@ -17,7 +17,7 @@
 namespace cdef::build_command {
 
 /* Pieces of work that threads take one after another, and their results. An exception of a piece is thrown by take().
- * */
+ */
 template <class Result> class worker_pool {
 public:
     using work_function = std::function<Result(std::size_t)>;

@@ -133,7 +133,7 @@ struct outcome {
 };
 
 /* Programs that map a database depend on its byte order, and programs that choose between two compare their versions.
- * */
+ */
 std::string mention_of_order(const compared &before, const compared &after) {
     return after.in.name + ": the other byte order than " + before.in.name;
 }

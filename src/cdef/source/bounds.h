@@ -35,7 +35,7 @@ enum class bounds : std::uint8_t { untouched, wanted, unwanted };
 range range_of(const class_plan &plan, const step &s);
 
 /* The value of a Range line that produces these bytes if it is converted to this type; empty if there is no such line.
- * */
+ */
 std::string line_value(const wanted_bytes &wanted, vx_data_type_t type);
 
 /* The bounds of an attribute after such a line. */

@@ -1,5 +1,5 @@
 /* lines.cpp: the lines of a stanza, made from the catalogue's attributes and the facts about the fields that they fill.
- * */
+ */
 
 #include "cdef/source/lines.h"
 

@@ -22,7 +22,7 @@ bool same_types(const std::vector<vx_data_type_t> &types, const cdb::sd_definiti
 }
 
 /* Structured data cannot contain structured data. Elements that become part of a value must have a type with a default.
- * */
+ */
 void require_types(const cdb::sd_definition &definition, bool makes_value, const std::string &place) {
     for (const cdb::sd_element &e : definition) {
         if (cdb::element_type(e.type()) == VX_SD_PTR || (makes_value && !has_default(e.type())))

@@ -10,7 +10,7 @@
 namespace cdef {
 
 /* The file that a path leads to through symbolic links; it need not exist. Throws failure if there are too many links.
- * */
+ */
 std::string target_of(const std::string &path);
 
 /* The temporary file for a target: .NAME.cdef-new in its directory; a name that would become too long is cut, and has a

@@ -39,7 +39,7 @@ public:
 };
 
 /* If the output is known: a class that is named after it. If the output gives no valid name, the compiler reports it.
- * */
+ */
 class no_name : public watcher {
 public:
     using watcher::watcher;

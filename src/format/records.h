@@ -14,8 +14,7 @@ struct record_format {
     std::span<const field_fact> facts; /* one for each field, in the same order */
     std::size_t size;                  /* bytes; of a list and a class hash, without the entries */
     const field *name = nullptr;       /* the field that leads to the record's name; null: the record has no name */
-    const field *type = nullptr;       /* the field with the data type of its values; null: the record has no such field
-                                        */
+    const field *type = nullptr;       /* the field with its values' data type; null: the record has none */
 
     /* Of the field that starts at this offset; one must. */
     constexpr const field_fact &fact_at(std::size_t offset) const {

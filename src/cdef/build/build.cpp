@@ -159,10 +159,10 @@ void add_options(CLI::App &command, build_options &options) {
     command.add_option("--timestamp", options.timestamp,
                        "Time in the database: none, now or SECONDS since 1970; SOURCE_DATE_EPOCH if it is set");
     command.add_option("--depfile", options.depfile, "Write to FILE what the databases depend on, as Make reads it");
-    command.add_option("-j,--jobs", options.jobs, "Compile so many sources at once")
+    command.add_option("-j,--jobs", options.jobs, "Compile this many sources at once")
         ->check(CLI::Range(1U, build_command::MOST_JOBS));
-    command.add_flag("--sync", options.sync, "Have each database on the disk before it takes its place");
-    command.add_flag("--list", options.list, "List the databases, and make none");
+    command.add_flag("--sync", options.sync, "Wait until each database is on the disk before it replaces the old one");
+    command.add_flag("--list", options.list, "List the databases and build none");
     add_finding_options(command, options.findings);
 }
 
@@ -170,7 +170,7 @@ void add_options(CLI::App &command, build_options &options) {
 
 void add_build(CLI::App &app, int &status) {
     auto options = std::make_shared<build_options>();
-    CLI::App *command = app.add_subcommand("build", "Checks sources and makes their databases");
+    CLI::App *command = app.add_subcommand("build", "Checks sources and builds their databases");
     add_options(*command, *options);
     command->footer(status_help("build"));
     command->callback([options, &status] { status = build_or_refuse(*options); });

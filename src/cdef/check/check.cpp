@@ -80,7 +80,7 @@ void add_check(CLI::App &app, int &status) {
     CLI::App *command = app.add_subcommand("check", "Checks sources and reports every mistake, not just the first");
     command->add_option("SOURCE", options->sources, "Source to check; - is standard input")->required();
     add_finding_options(*command, options->findings);
-    CLI::Option *fix = command->add_flag("--fix", options->fixes, "Correct what is surely meant otherwise");
+    CLI::Option *fix = command->add_flag("--fix", options->fixes, "Make the corrections that are certain");
     command->add_flag("--dry-run", options->changes_nothing, "Show as a diff what --fix would change")->needs(fix);
     command->footer(status_help("check"));
     command->callback([options, &status] { status = check_all(*options); });

@@ -211,8 +211,8 @@ void add_diff(CLI::App &app, int &status) {
     command->add_option("B", options->after, "Second database; - is standard input")->required();
     command
         ->add_flag("--compat", options->compat,
-                   "Show only what breaks for whoever relies on A, and why: readers (without =), also clients, also "
-                   "what is stored")
+                   "Show only differences that break what relies on A, and why: readers (the default), also clients, "
+                   "also stored values")
         ->check(check_level)
         ->option_text("[=LEVEL:{readers,clients,stored}]");
     add_forms(*command, options->form, {"text", "json"}, "Form of the differences: text or json");

@@ -78,20 +78,23 @@ void add_report_options(CLI::App &command, finding_options &options) {
 void add_project_rules(CLI::App &command, finding_options &options) {
     auto set_count = [&options](bool count) { return [&options, count] { options.warnings_count = count; }; };
     CLI::Option *werror = command.add_flag_callback("--werror", set_count(true), "Count warnings as errors");
-    command.add_flag_callback("--no-werror", set_count(false), "Do not, whatever cdef.toml says")->excludes(werror);
+    command
+        .add_flag_callback("--no-werror", set_count(false),
+                           "Do not count warnings as errors, even if cdef.toml says so")
+        ->excludes(werror);
     add_project_options(command, options.project);
 }
 
 void add_finding_options(CLI::App &command, finding_options &options) {
     add_report_options(command, options);
-    command.add_option("--warn", options.wanted, "Turn on warning NAME, or all")
+    command.add_option("--warn", options.wanted, "Turn on warning NAME ('cdef explain' lists names and codes), or all")
         ->type_name("NAME")
         ->allow_extra_args(false)
-        ->check(CLI::IsMember(warning_names()));
+        ->check(CLI::IsMember(warning_names()).description(""));
     command.add_option("--no-warn", options.unwanted, "Turn off warning NAME, or all")
         ->type_name("NAME")
         ->allow_extra_args(false)
-        ->check(CLI::IsMember(warning_names()));
+        ->check(CLI::IsMember(warning_names()).description(""));
     add_project_rules(command, options);
 }
 

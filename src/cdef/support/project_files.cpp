@@ -12,7 +12,7 @@
 namespace cdef {
 
 void add_project_options(CLI::App &command, project_options &options) {
-    CLI::Option *file = command.add_option("--config", options.file, "Read FILE instead of the next cdef.toml");
+    CLI::Option *file = command.add_option("--config", options.file, "Read FILE instead of the nearest cdef.toml");
     file->type_name("FILE");
     command.add_flag("--no-config", options.none, "Read no cdef.toml")->excludes(file);
 }

@@ -96,8 +96,8 @@ int run(const verify_options &options) {
 
 void add_verify(CLI::App &app, int &status) {
     auto options = std::make_shared<verify_options>();
-    CLI::App *command =
-        app.add_subcommand("verify", "Checks whether databases are sound; prints nothing if there is nothing to report");
+    CLI::App *command = app.add_subcommand(
+        "verify", "Checks whether databases are sound; prints nothing if there is nothing to report");
     command->add_option("FILE", options->files, "Database to verify; - is standard input")->required();
     add_forms(*command, options->form, {"text", "json", "sarif", "github", "gitlab"}, "Form of the findings");
     command->add_flag("--all", options->shows_all, "Show the findings that follow from others too");

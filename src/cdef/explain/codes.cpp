@@ -40,8 +40,8 @@ explanation explained(const compare::breach_rule &row) {
         row.title,
         "Whoever relies on the older version is affected: " + std::string(row.reason) + ". It counts at the level `" +
             std::string(compare::name_of(row.broken_for)) + "` and those after it.",
-        "Take the change back, or add something new beside what was there. If nobody relies on the older version in "
-        "this way, choose a level before this one.",
+        "Take the change back, or add something new beside what was there, unless nobody relies on the older version "
+        "in this way.",
         nullptr};
 }
 

@@ -93,8 +93,8 @@ Cause:
   property. It counts at the level `clients` and those after it.
 
 Cure:
-  Take the change back, or add something new beside what was there. If nobody
-  relies on the older version in this way, choose a level before this one.
+  Take the change back, or add something new beside what was there, unless
+  nobody relies on the older version in this way.
 """
 
 

@@ -100,7 +100,7 @@ void collector::add_corrections() {
         for (const check::edit &made : each.fix.edits)
             edits.push_back(byte_edit(in, now.client.units, places.of(made), made.text));
         json &action = add(title_of(each), QUICK_FIX, std::move(edits));
-        action["diagnostics"] = diagnostics_of(in.text(), in.lines(), in.uri(), {&each, 1}, now.form());
+        action["diagnostics"] = json::parse(diagnostics_text(in.text(), in.lines(), in.uri(), {&each, 1}, now.form()));
         if (each.fix.sure == check::certainty::certain)
             action["isPreferred"] = true;
     }

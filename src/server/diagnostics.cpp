@@ -2,15 +2,14 @@
 
 #include "server/diagnostics.h"
 
+#include "report/json_writer.h"
+
 #include <algorithm>
 #include <cctype>
 
 namespace lsp {
 
 namespace {
-
-constexpr int ERROR = 1;
-constexpr int WARNING = 2;
 
 /* The page has an anchor for each code, in small letters. */
 std::string link_to(const std::string &explanations, std::string_view code) {
@@ -56,57 +55,95 @@ stretch finding_places::of(const check::edit &change) const {
 
 namespace {
 
-/* Makes the diagnostics of one document. */
-class maker {
-public:
-    maker(std::string_view text, const line_table &lines, const std::string &called, const diagnostic_form &wanted)
-        : uri(called), form(wanted), places(text), positions(text, lines, wanted.units),
-          note_positions(text, lines, wanted.units) {}
+void append_number(std::string &to, std::size_t number) {
+    to += std::to_string(number);
+}
 
-    json of(const check::finding &found) {
-        json made = {{"range", to_json(positions.of(places.of(found.at)))},
-                     {"severity", found.error ? ERROR : WARNING},
-                     {"code", found.code},
-                     {"source", "cdef"},
-                     {"message", found.text},
-                     {"data", {{"name", found.name}}}};
-        if (form.links && !form.explanations.empty())
-            made["codeDescription"]["href"] = link_to(form.explanations, found.code);
-        for (const check::note &more : found.notes)
-            add_note(made, more, found);
-        return made;
+/* Writes the diagnostics of one document. There may be very many, so that no document of JSON values is made first. */
+class list_writer {
+public:
+    list_writer(std::string_view text, const line_table &lines, const std::string &called,
+                const diagnostic_form &wanted)
+        : form(wanted), places(text), positions(text, lines, wanted.units), note_positions(text, lines, wanted.units) {
+        report::append_json(uri, called);
+    }
+
+    void add(const check::finding &found) {
+        made += made.size() == 1 ? "{" : ",{";
+        add_range(positions.of(places.of(found.at)));
+        made += found.error ? R"(,"severity":1,"source":"cdef","code":)" : R"(,"severity":2,"source":"cdef","code":)";
+        report::append_json(made, found.code);
+        made += R"(,"data":{"name":)";
+        report::append_json(made, found.name);
+        made += R"(},"message":)";
+        report::append_json(made, message_of(found));
+        if (form.links && !form.explanations.empty()) {
+            made += R"(,"codeDescription":{"href":)";
+            report::append_json(made, link_to(form.explanations, found.code));
+            made += "}";
+        }
+        if (form.relates && !found.notes.empty())
+            add_notes(found);
+        made += "}";
+    }
+    std::string take() {
+        return std::move(made) + "]";
     }
 
 private:
-    void add_note(json &to, const check::note &more, const check::finding &found) {
-        if (!form.relates) {
-            to["message"] = to["message"].get<std::string>() + "\n" + more.text;
-            return;
+    std::string message_of(const check::finding &found) const {
+        std::string text = found.text;
+        for (const check::note &more : found.notes)
+            text += form.relates ? std::string() : "\n" + more.text;
+        return text;
+    }
+    void add_position(std::string_view name, const position &at) {
+        made.append("\"").append(name).append(R"(":{"line":)");
+        append_number(made, at.line);
+        made += R"(,"character":)";
+        append_number(made, at.character);
+        made += "}";
+    }
+    void add_range(const range &of) {
+        made += R"("range":{)";
+        add_position("start", of.start);
+        made += ",";
+        add_position("end", of.end);
+        made += "}";
+    }
+    void add_notes(const check::finding &found) {
+        made += R"(,"relatedInformation":[)";
+        for (const check::note &more : found.notes) {
+            made.append(&more == found.notes.data() ? "" : ",")
+                .append(R"({"location":{"uri":)")
+                .append(uri)
+                .append(",");
+            add_range(note_positions.of(places.of(more.at.line == 0 ? found.at : more.at)));
+            made += R"(},"message":)";
+            report::append_json(made, more.text);
+            made += "}";
         }
-        const check::place &at = more.at.line == 0 ? found.at : more.at;
-        to["relatedInformation"].push_back(
-            {{"location", {{"uri", uri}, {"range", to_json(note_positions.of(places.of(at)))}}},
-             {"message", more.text}});
+        made += "]";
     }
 
-    const std::string &uri;
     const diagnostic_form &form;
+    std::string uri; /* as JSON */
     finding_places places;
     position_maker positions;
     position_maker note_positions;
+    std::string made = "[";
 };
 
 } // namespace
 
-json diagnostics_of(std::string_view text, const line_table &lines, const std::string &uri,
-                    std::span<const check::finding> findings, const diagnostic_form &form) {
-    json all = json::array();
+std::string diagnostics_text(std::string_view text, const line_table &lines, const std::string &uri,
+                             std::span<const check::finding> findings, const diagnostic_form &form) {
     if (findings.empty())
-        return all;
-    maker make(text, lines, uri, form);
+        return "[]";
+    list_writer list(text, lines, uri, form);
     for (const check::finding &each : findings)
-        all.push_back(make.of(each));
-    return all;
+        list.add(each);
+    return list.take();
 }
 
 } // namespace lsp

@@ -4,7 +4,6 @@
 
 #include "check/check.h"
 #include "server/positions.h"
-#include "server/rpc.h"
 
 #include <span>
 #include <string>
@@ -37,9 +36,9 @@ private:
     std::vector<std::size_t> begins; /* of the lines that end with a newline, as findings count them */
 };
 
-/* The list of diagnostics of a document. */
-json diagnostics_of(std::string_view text, const line_table &lines, const std::string &uri,
-                    std::span<const check::finding> findings, const diagnostic_form &form);
+/* The list of diagnostics of a document, as JSON. */
+std::string diagnostics_text(std::string_view text, const line_table &lines, const std::string &uri,
+                             std::span<const check::finding> findings, const diagnostic_form &form);
 
 } // namespace lsp
 

@@ -13,10 +13,11 @@ namespace lsp {
 namespace {
 
 /* The findings of a text, those of its own before those that other classes cause. */
-json diagnostics_in(session &now, const std::string &uri, const document &in, std::vector<check::finding> findings) {
+std::string diagnostics_in(session &now, const std::string &uri, const document &in,
+                           std::vector<check::finding> findings) {
     std::vector<check::finding> across = now.sources.across(key_of(uri));
     findings.insert(findings.end(), across.begin(), across.end());
-    return diagnostics_of(in.text(), in.lines(), uri, findings, now.form());
+    return diagnostics_text(in.text(), in.lines(), uri, findings, now.form());
 }
 
 /* A line counts from 0, or is the first one; a column counts characters. */
@@ -62,12 +63,14 @@ void publish(session &now, const std::string &uri) {
         return;
     }
     report_of_document found = report_on(now, uri);
-    json params = {{"uri", uri}, {"diagnostics", std::move(found.diagnostics)}};
-    if (auto open = now.open.find(key_of(uri)); open != now.open.end())
-        params["uri"] = open->second.uri();
+    auto open = now.open.find(key_of(uri));
+    json params = {{"uri", open == now.open.end() ? uri : open->second.uri()}};
     if (!found.version.is_null())
-        params["version"] = std::move(found.version);
-    now.send(notification("textDocument/publishDiagnostics", std::move(params)));
+        params["version"] = found.version;
+    /* The list may be long, and is JSON already. */
+    std::string text = R"({"jsonrpc":"2.0","method":"textDocument/publishDiagnostics","params":{"diagnostics":)" +
+                       found.diagnostics + "," + written(params).substr(1) + "}";
+    now.outbox.push_back(std::move(text));
 }
 
 void publish_problems(session &now) {

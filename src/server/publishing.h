@@ -17,8 +17,8 @@ void publish_problems(session &now);
 
 /* All findings of a document, as it is open or stored. */
 struct report_of_document {
-    json version; /* null for a document that is not open */
-    json diagnostics = json::array();
+    json version;                   /* null for a document that is not open */
+    std::string diagnostics = "[]"; /* JSON */
 };
 
 report_of_document report_on(session &now, const std::string &uri);

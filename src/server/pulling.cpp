@@ -4,6 +4,7 @@
 
 #include "report/places.h"
 #include "server/publishing.h"
+#include "server/synchronisation.h"
 #include "server/uris.h"
 
 #include <functional>
@@ -14,8 +15,8 @@ namespace lsp {
 namespace {
 
 /* The same findings have the same name. */
-std::string result_id(const json &diagnostics) {
-    return std::to_string(std::hash<std::string>()(written(diagnostics)));
+std::string result_id(const std::string &diagnostics) {
+    return std::to_string(std::hash<std::string>()(diagnostics));
 }
 
 json pulled(session &now, const std::string &uri, const json *previous) {
@@ -23,7 +24,7 @@ json pulled(session &now, const std::string &uri, const json *previous) {
     std::string id = result_id(found.diagnostics);
     json report = {{"kind", "unchanged"}, {"resultId", id}};
     if (previous == nullptr || *previous != id)
-        report = {{"kind", "full"}, {"resultId", id}, {"items", std::move(found.diagnostics)}};
+        report = {{"kind", "full"}, {"resultId", id}, {"items", json::parse(found.diagnostics)}};
     report["version"] = found.version;
     return report;
 }
@@ -48,6 +49,8 @@ json document_diagnostic(session &now, const json &params) {
 }
 
 json workspace_diagnostic(session &now, const json &params) {
+    while (!now.unpublished.empty())
+        publish_next(now);
     while (now.sources.has_work())
         now.sources.step(now);
     const std::map<std::string, json> earlier = results_before(params);

@@ -258,10 +258,7 @@ void server::handle_notification(const json &message) {
 }
 
 std::vector<std::string> server::take_output() {
-    std::vector<std::string> bodies;
-    for (const json &each : std::exchange(now.outbox, {}))
-        bodies.push_back(written(each));
-    return bodies;
+    return std::exchange(now.outbox, {});
 }
 
 } // namespace lsp

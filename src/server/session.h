@@ -64,8 +64,8 @@ struct session {
     diagnostic_form form() const {
         return {client.units, client.relates, client.links, world.explanations};
     }
-    void send(json message) {
-        outbox.push_back(std::move(message));
+    void send(const json &message) {
+        outbox.push_back(written(message));
     }
     /* Sends a request of the server, whose answer does not matter. */
     void ask(std::string_view method, json params) {
@@ -80,7 +80,7 @@ struct session {
     workspace sources;
     std::map<std::string, document> open; /* by key_of their URIs */
     std::set<std::string> unpublished;    /* keys of open documents that changed since their findings were sent */
-    std::vector<json> outbox;
+    std::vector<std::string> outbox;
     unsigned asked = 0;      /* requests of the server */
     bool asks_again = false; /* the client is to ask for findings again */
 };

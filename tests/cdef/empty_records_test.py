@@ -5,6 +5,7 @@ EMPTY_RECORDS is how many records the databases have that say nothing: 30,000 by
 """
 
 import os
+import re
 import struct
 import subprocess
 
@@ -81,6 +82,22 @@ def test_verify_many_findings(directory, form, mark):
             found += line.count(b"CDB203")
             marks += line.count(mark)
     assert (found, marks) == (RECORDS, 1)
+
+
+@pytest.mark.slow(10)
+@pytest.mark.parametrize(("form", "mark"), [
+    ("sarif", b'"ruleId":"CDB203"'), ("github", b",title=CDB203::"), ("gitlab", b'"check_name": "CDB203"')])
+def test_verify_many_findings_for_services(directory, form, mark):
+    """Each is one of its own, with a fingerprint of its own where there are fingerprints."""
+    path = empty_anchors(directory)
+    status, out, errors = run_bounded(directory, [PROGRAMS.cdef, "verify", "--format", form], path)
+    assert (status, errors) == (1, b"")
+    with out.open("rb") as lines:
+        assert sum(mark in line for line in lines) == RECORDS
+    text = out.read_bytes()
+    prints = re.findall(rb'"(?:fingerprint|codeAndField/v1)": ?"(\w+)"', text)
+    assert len(set(prints)) == len(prints)
+    assert (len(prints) >= RECORDS) == (form != "github")
 
 
 @pytest.mark.slow(10)

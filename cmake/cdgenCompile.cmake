@@ -10,7 +10,7 @@
 #   NO_TIMESTAMP  the database has no time of building: equal sources then make equal files
 #   WERROR        a source with warnings makes no database
 #
-# The database is made anew when the source or cdef has changed. If the source is at fault, what was there stays.
+# The database is built again when the source or cdef has changed. If the source has errors, the old database stays.
 
 function(cdgen_compile TARGET SOURCE OUTPUT)
   cmake_parse_arguments(PARSE_ARGV 3 arg "NO_TIMESTAMP;WERROR" "BYTE_ORDER" "")
@@ -45,7 +45,7 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
     list(APPEND options --werror)
   endif()
 
-  # Names that differ in what a target's name cannot hold (a-b, a_b) differ in the hash.
+  # The hash distinguishes names that are equal without characters that a target's name cannot have (a-b, a_b).
   string(MD5 hash "${shown}")
   string(SUBSTRING "${hash}" 0 8 hash)
 
@@ -58,7 +58,7 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
     set(restat COMMAND "${CMAKE_COMMAND}" -E touch_nocreate ${databases})
   endif()
 
-  # A class without a Name is called after the output as the command line has it, which is the bare name.
+  # A class without a Name is named after the output as given on the command line, which is the bare file name.
   add_custom_command(OUTPUT ${databases}
     COMMAND "${CMAKE_COMMAND}" -E make_directory "${place}"
     COMMAND "${CMAKE_COMMAND}" -E chdir "${place}" "$<TARGET_FILE:cdgen::cdef>" build ${options} -- "${SOURCE}"

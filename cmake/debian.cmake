@@ -12,7 +12,7 @@ function(compress)
   endforeach()
 endfunction()
 
-# Every package says whose it is and what has changed.
+# Every package has its copyright and the list of changes.
 function(complete component package)
   set(share "${CPACK_TEMPORARY_DIRECTORY}/${component}${CPACK_PACKAGING_INSTALL_PREFIX}/share")
   set(doc "${share}/doc/${package}")

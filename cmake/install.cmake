@@ -1,4 +1,4 @@
-# What cmake --install puts where. Nothing of it holds the prefix, so an installed tree may be moved.
+# What cmake --install installs, and where. No file contains the prefix, so an installed tree may be moved.
 
 include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)

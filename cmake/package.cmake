@@ -7,7 +7,7 @@ set(CPACK_PROJECT_CONFIG_FILE "${PROJECT_SOURCE_DIR}/cmake/package_time.cmake")
 
 set(CPACK_PACKAGE_NAME cdgen)
 set(CPACK_PACKAGE_VENDOR "the cdgen maintainers")
-# Nobody's address: who makes a package for others says who they are, see docs/install.md.
+# Not a real address: if you make packages for others, set your own, see docs/install.md.
 set(CPACK_PACKAGE_CONTACT "cdgen maintainers <maintainers@cdgen.invalid>")
 set(CPACK_PACKAGE_DESCRIPTION_SUMMARY "compiler for resource class definitions")
 set(CPACK_PACKAGE_DESCRIPTION "cdgen compiles the definition of a resource class, written as text, into a

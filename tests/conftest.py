@@ -1,4 +1,4 @@
-"""What all tests share: which build is tested, a world of their own for cases, and the order of the slow ones."""
+"""Options and fixtures of all tests: the build to test, a directory for each case, and the order of slow tests."""
 
 import pathlib
 import tempfile

@@ -1,4 +1,4 @@
-"""Compiles what the documents, the manual pages and examples/ show, and holds made files against what makes them."""
+"""Compiles the sources in documents, manual pages and examples, and checks that generated files are up to date."""
 
 import datetime
 import pathlib

@@ -1,4 +1,4 @@
-"""Does what a document tells its reader to do, in the document's order, and compares what is printed.
+"""Runs the commands of a document in their order, and compares the output with that in the document.
 
 Three kinds of blocks count:
 
@@ -51,13 +51,13 @@ def commands(block):
 
 
 def agrees(expected, printed):
-    """Whether the lines are those of the document; `...` stands for any."""
+    """True if the output is that of the document; `...` stands for any lines."""
     pattern = "".join(r"(?:.*\n)*?" if line == "..." else re.escape(line + "\n") for line in expected)
     return re.fullmatch(pattern, printed) is not None
 
 
 def run(command, place, environment):
-    """What a command of the document prints, on both streams."""
+    """The output of a command, on both streams."""
     return subprocess.run(["sh", "-c", command], cwd=place, env=environment, text=True, check=False,
                           stdout=subprocess.PIPE, stderr=subprocess.STDOUT, timeout=60).stdout
 

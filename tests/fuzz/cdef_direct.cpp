@@ -1,4 +1,4 @@
-/* cdef_direct.cpp: what the subcommands of cdef consist of, without a command line. */
+/* cdef_direct.cpp: the functions that the subcommands of cdef call, without a command line. */
 
 #include "cdef_direct.h"
 

@@ -1,5 +1,5 @@
-/* cdef_direct.h: what the subcommands of cdef consist of, called without a command line and without files, which take
- * most of the time that a small input takes. Each function fails if what comes does not go together. */
+/* cdef_direct.h: the functions that the subcommands of cdef call, without a command line and files, which take most of
+ * the time for a small input. Each function fails if its results contradict each other. */
 #ifndef CDGEN_FUZZ_CDEF_DIRECT_H
 #define CDGEN_FUZZ_CDEF_DIRECT_H
 

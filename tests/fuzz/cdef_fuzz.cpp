@@ -57,7 +57,7 @@ private:
     int fd;
 };
 
-/* What a run of cdef came to. */
+/* The result of a run of cdef. */
 struct outcome {
     int status;
     std::string out;
@@ -100,7 +100,7 @@ json parsed(const std::string &text) {
 struct judgement {
     bool found;    /* anything */
     bool sound;    /* no errors */
-    bool readable; /* no errors but those that leave the rest readable */
+    bool readable; /* only errors that leave the rest readable */
 };
 
 judgement judge(const bytes &image) {
@@ -115,7 +115,8 @@ judgement judge(const bytes &image) {
     return all;
 }
 
-/* The files of a run. Standard output is no terminal then: cdef source does not write everything to one. */
+/* The files of a run. Standard output is then not a terminal, because cdef source does not write everything to a
+ * terminal. */
 struct files {
     files() : directory("/dev/shm/cdef-fuzz-XXXXXX") {
         int null = open("/dev/null", O_WRONLY | O_CLOEXEC);
@@ -142,12 +143,12 @@ files &all_files() {
     return f;
 }
 
-/* What the compiler makes of a source: the database, at the place for it, or a message. */
+/* The result of compiling a source: the database in its file, or a message. */
 outcome compiled(const memory_file &source) {
     return run(cdgen_main, {"-n", source.path, all_files().output});
 }
 
-/* Whether the word that names the format is in the header, in either byte order. */
+/* True if the format word is in the header, in either byte order. */
 bool has_format_word(const bytes &file) {
     constexpr std::size_t AT = offsetof(orb_cdb_header_t, cdb_hdr_format);
     if (file.size() < AT + 4)
@@ -162,7 +163,7 @@ bool is_text(const bytes &file) {
     return !file.empty() && !has_format_word(file) && std::memchr(file.data(), 0, beginning) == nullptr;
 }
 
-/* A consequence comes after its cause, which is the consequence of nothing. */
+/* A consequence comes after its cause, and a cause is not a consequence itself. */
 void expect_causes(const json &findings) {
     for (std::size_t i = 0; i < findings.size(); ++i) {
         const json &cause = findings[i].at("cause");
@@ -226,7 +227,7 @@ void look_at_hex(const outcome &came, const bytes &image, const words & /*form*/
     fuzz::require(shown == image, "other bytes are shown than the file has");
 }
 
-/* Where the source says itself that its output needs a certain name, it is not compiled. */
+/* A source that needs an output of a certain name is not compiled. */
 void look_at_source(const outcome &came, const bytes &image, const words & /*form*/) {
     bool refused = came.err.find(": no source: ") != std::string::npos;
     fuzz::require(came.status == (judge(image).readable && !refused ? cdef::OK : cdef::FAILED), "no source, no reason");
@@ -261,12 +262,12 @@ void look_at_diff(const outcome &came, const bytes &before, const bytes &after, 
 /* ---- Sources ------------------------------------------------------------------------------------------------------
  */
 
-/* As JSON tells a text: bytes that are no UTF-8 are replaced. */
+/* The text as JSON has it: bytes that are not UTF-8 are replaced. */
 std::string told(const std::string &text) {
     return json::parse(json(text).dump(-1, ' ', false, json::error_handler_t::replace)).get<std::string>();
 }
 
-/* The line in which the compiler met an error: a note has it if the error is reported where its cause is. */
+/* The line in which the compiler found an error. If the error is reported at its cause, a note has this line. */
 json line_of(const json &error) {
     for (const json &note : error.at("notes"))
         if (note.at("message").get<std::string>().starts_with("the compiler stops here"))
@@ -362,7 +363,7 @@ outcome shown(words arguments, const words &paths) {
     bool is_source = arguments.front() == "source" || arguments == correcting.arguments;
     arguments.insert(arguments.end(), paths.begin(), paths.end());
     outcome came = cdef_says(arguments);
-    if (!is_source) /* texts stand in it as they are */
+    if (!is_source) /* it contains texts unchanged */
         fuzz::expect_harmless(came.out);
     fuzz::expect_harmless(came.err);
     return came;
@@ -391,7 +392,7 @@ void try_comparison(const form &with, const pair_of_files &both, bool by_command
     look_at_diff(shown(with.arguments, {f.first.path, f.second.path}), both.before, both.after, with.arguments);
 }
 
-/* As much of a source as is checked each time: unknown names, of which there are many, take long. */
+/* The most bytes of a source that are checked each time, because many unknown names take long. */
 bytes beginning_of(const bytes &source) {
 #ifdef CDGEN_FUZZ
     constexpr std::size_t MOST = 512;
@@ -413,8 +414,8 @@ void try_file(const form &with, const bytes &file, bool by_command_line) {
     with.look(shown(with.arguments, {f.first.path}), file, with.arguments);
 }
 
-/* Whether an input is also given to the program by its command line, which takes ten times as long. The input alone
- * decides. A replay has the time for all of them. */
+/* True if an input is also passed to the program through its command line, which takes ten times as long. Only the
+ * input decides this. A replay has time for all of them. */
 bool takes_command_line(std::span<const std::uint8_t> data) {
 #ifdef CDGEN_FUZZ
     constexpr std::uint32_t ONE_IN = 64;

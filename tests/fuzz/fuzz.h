@@ -1,4 +1,4 @@
-/* fuzz.h: what the fuzz targets share: how they fail, and what they do with a database. */
+/* fuzz.h: functions that the fuzz targets share: how they fail, and what they do with a database. */
 #ifndef CDGEN_FUZZ_H
 #define CDGEN_FUZZ_H
 
@@ -18,7 +18,7 @@
 
 namespace fuzz {
 
-/* Ends the process with a text on the real standard error: one that stands for a defect. */
+/* Ends the process with a text on the real standard error, because a defect was found. */
 [[noreturn]] inline void fail(std::string text) {
     text += "\n";
     [[maybe_unused]] ssize_t written = write(STDERR_FILENO, text.data(), text.size());
@@ -35,7 +35,7 @@ inline std::string text_of(const cdb::finding &f) {
            std::string(f.field) + " at " + std::to_string(f.offset) + ": found " + f.found + ", expected " + f.expected;
 }
 
-/* Through all views; into values of values only where they are sound. */
+/* Reads a database through all views; nested values only if it is sound. */
 inline void read_all(const cdb::database &db, bool sound) {
     reading::everything all(sound);
     all.read(db);
@@ -50,8 +50,8 @@ inline void put(std::span<std::byte> image, std::size_t at, std::uint32_t word, 
     std::copy(raw.begin(), raw.end(), image.begin() + static_cast<std::ptrdiff_t>(at));
 }
 
-/* Sets length and checksum right, which chance never does; without it hardly anything would be sound. The image has a
- * header at least. */
+/* Corrects length and checksum, which random changes never do; without this hardly any input would be sound. The image
+ * must have at least a header. */
 inline void make_whole(std::span<std::byte> image, std::endian order) {
     cdb::bytes all(image, order);
     auto length = static_cast<std::uint32_t>(image.size() - 4);

@@ -12,8 +12,8 @@ namespace fuzz {
 
 namespace {
 
-/* A second statement of what a terminal must not get, by the bytes that stand for it; the program's own goes by
- * characters. Line separator, marks and overrides of the writing direction, byte order mark. */
+/* A second definition of what a terminal must not get, by bytes; the program's own definition is by characters. Line
+ * separator, marks and overrides of the writing direction, byte order mark. */
 constexpr std::array<std::string_view, 9> acted_upon = {"\xE2\x80\xA8", "\xE2\x80\x8E", "\xE2\x80\x8F",
                                                         "\xE2\x80\xAA", "\xE2\x80\xAE", "\xE2\x81\xA6",
                                                         "\xE2\x81\xA9", "\xEF\xBB\xBF", "\xC2\xAD"};

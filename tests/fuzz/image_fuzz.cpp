@@ -8,7 +8,7 @@
 
 namespace {
 
-/* Bytes at their own end of memory, so that the first one behind them is seen, and at any alignment. */
+/* Bytes at the end of their memory, so that reading after them is noticed, and at any alignment. */
 class copy_of {
 public:
     copy_of(const std::uint8_t *data, std::size_t size, std::size_t off)
@@ -37,8 +37,8 @@ void check_regions(const cdb::database &db) {
     fuzz::require(end == db.file().size(), "regions do not cover the file");
 }
 
-/* Unsound files are read too, which must be safe, if they are so small that all of it takes no time: lists may share
- * their entries in them, and those others. */
+/* Unsound files are read too, which must be safe, if they are small enough that this is quick: their lists may contain
+ * each other. */
 constexpr std::size_t UNSOUND_SIZE_MAX = 1000;
 
 std::vector<cdb::finding> verified(const cdb::database &db) {

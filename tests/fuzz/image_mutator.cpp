@@ -1,4 +1,4 @@
-/* image_mutator.cpp: how libFuzzer changes the inputs of image_fuzz: by sections and fields, or as it does by itself.
+/* image_mutator.cpp: how libFuzzer changes the inputs of image_fuzz: by sections and fields, or with its own mutations.
  */
 
 #include "mutate.h"

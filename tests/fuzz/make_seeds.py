@@ -111,7 +111,7 @@ def escaped(word):
 
 
 def words(command):
-    """Every word of the language, with what stands around it."""
+    """Every word of the language, with the characters around it."""
     listed = subprocess.run(command, capture_output=True, text=True, check=True).stdout
     for line in listed.splitlines():
         what, *rest = line.split()

@@ -117,8 +117,8 @@ std::size_t counted_size(const cdb::region &r) {
     return 1;
 }
 
-/* 0, 1, as many as there is room for and one more, one more or fewer than now, and numbers of which a multiple is small
- * again in 32 bits. */
+/* Counts to try: 0, 1, as many as there is room for and one more, one more or fewer than now, and numbers whose
+ * multiples overflow to small numbers in 32 bits. */
 std::uint32_t some_count(const mapped &m, const cdb::region &r, chance &random) {
     std::uint32_t now = number_in(m, r);
     auto most = static_cast<std::uint32_t>(bytes_after(m, r) / counted_size(r));
@@ -205,7 +205,7 @@ void move_tables(section_part &section, const rsrc_class_t &rc, std::size_t afte
             put_number(class_field(section, cdb::side_tables[i].ref), offset + bytes, order);
 }
 
-/* A class section with its record in this machine's order; nothing if there is none. */
+/* A class section with its record in this machine's order; no value if there is no class. */
 struct open_class {
     section_part &section;
     rsrc_class_t record;

@@ -1,4 +1,4 @@
-/* source_fuzz: compiles arbitrary bytes, and looks through what comes of them.
+/* source_fuzz: compiles arbitrary bytes, and examines the result.
  *
  * The first byte holds the options: bit 0 n, bits 1 and 2 the level of d, bit 3 s, bit 4 an output whose name no class
  * can take, bit 5 an output that exists, bits 6 and 7 a source that stands across the end of the read buffer. The rest
@@ -41,7 +41,7 @@ public:
         rmdir(directory.c_str());
     }
 
-    /* Behind so many lines of comment. */
+    /* After this many lines of comment. */
     void write_source(const std::uint8_t *data, std::size_t size, std::size_t lines) const {
         std::string text;
         for (std::size_t i = 0; i < lines; ++i)

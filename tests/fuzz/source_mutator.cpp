@@ -1,4 +1,4 @@
-/* source_mutator.cpp: how libFuzzer changes the inputs of source_fuzz: by stanzas and lines, or as it does by itself.
+/* source_mutator.cpp: how libFuzzer changes the inputs of source_fuzz: by stanzas and lines, or with its own mutations.
  */
 
 #include "mutate.h"

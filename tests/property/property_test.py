@@ -204,7 +204,7 @@ class Batch:
         return {name: (int(status), message) for name, (status, message) in zip(names, answers)}
 
     def holds(self, name, *check):
-        """Notes a problem of a source and goes on."""
+        """Notes a problem of a source and continues."""
         try:
             check[0](*check[1:])
         except (Problem, struct.error, IndexError, ValueError) as problem:

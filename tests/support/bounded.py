@@ -14,7 +14,7 @@ MEGABYTES = 1 << 20
 
 
 def run_bounded(directory, command, *inputs):
-    """Status, and what is said on both streams."""
+    """The status, and the output on both streams."""
     if PROGRAMS.sanitizers or not PROGRAMS.is_on("CDGEN_STATIC"):
         pytest.skip("a sanitizer or a shared library takes address space of its own")
     bound = 8 * sum(path.stat().st_size for path in inputs) + 16 * MEGABYTES

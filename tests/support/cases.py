@@ -151,5 +151,5 @@ def limit(what, value):
 
 
 def only_zeros(world):
-    """What a failed filling leaves is no half database."""
+    """A file that could not be filled contains only zeros, not half a database."""
     check(not world.read().strip(b"\0"), "the file is not empty of data")

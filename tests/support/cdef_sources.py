@@ -33,7 +33,7 @@ LINE = 253
 
 
 class Writer:
-    """One source in the making."""
+    """Writes one source."""
 
     def __init__(self, seed):
         self.random = random.Random(seed)
@@ -180,7 +180,7 @@ class Writer:
             self.run(kind, ("None", "RH", "RHArray"))
 
     def run(self, kind, more_types):
-        """A run of SD stanzas; behind another of its kind it would be part of that."""
+        """A run of SD stanzas. Directly after another run of its kind it would be part of that run."""
         if next(line for line in reversed(self.lines) if line[0] not in "\t ") == kind:
             return
         index = 0

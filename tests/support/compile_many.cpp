@@ -18,7 +18,7 @@
 
 namespace {
 
-/* Puts a file in a standard stream's place; returns the stream's former one. */
+/* Redirects a standard stream to a file; returns the stream's former file. */
 int replace(int stream, int with) {
     int former = dup(stream);
     dup2(with, stream);

@@ -71,7 +71,7 @@ class Truth:
 
 
 class Writer:
-    """One source in the making."""
+    """Writes one source."""
 
     def __init__(self, seed):
         self.random = random.Random(seed)
@@ -256,7 +256,7 @@ class Writer:
         self.structure("DAttrSDDefinition", name)
 
     def range(self, data_type):
-        """A range; ignored for types that are no numbers."""
+        """A range; ignored for types that are not numbers."""
         numeric = data_type.removesuffix("Array") in (*INTEGERS, "Float32", "Float64")
         self.attribute("Range", ",".join(self.value(data_type) if numeric else str(i) for i in (1, 2)))
 
@@ -283,7 +283,7 @@ class Writer:
             self.run(kind)
 
     def class_input(self):
-        """One of the class's inputs; not the one before, whose run would go on."""
+        """One of the class's inputs, but not the previous one, whose run would continue."""
         kind = self.random.choice([kind for kind in INPUTS if kind != self.input_before])
         self.run(kind, types=INPUT_TYPES)
         self.input_before = kind
@@ -380,7 +380,7 @@ class Writer:
 
 
 def source(seed):
-    """The source of a seed, and what must come of it."""
+    """The source of a seed, and what its database must contain."""
     return Writer(seed).whole()
 
 

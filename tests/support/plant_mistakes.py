@@ -134,7 +134,7 @@ class Planter:
         self.lines.insert(to, self.lines.pop(at))
 
     def move_down(self, at, to):
-        """Moves a line to a place behind it."""
+        """Moves a line down."""
         self.lines.insert(to, self.lines.pop(at))
 
     def new_value(self, names, value):
@@ -269,7 +269,7 @@ class Planter:
         return [at]
 
     def missing_stanza(self):
-        """A stanza is missing without which there is no class, or nobody to manage it."""
+        """A stanza is missing without which there is no class or no manager."""
         one = self.choose([one for one in self.stanzas if one.kind in ("ControlDefinition", "ClassToManagerMapping")])
         del self.lines[one.header:one.end]
         return list(range(len(self.lines)))
@@ -367,7 +367,7 @@ class Planter:
         return self.new_value(NUMBERS, self.chooser.choice(("none", "x", "one")))
 
     def letter_in_number(self):
-        """A number ends with a letter that is no digit."""
+        """A number ends with a letter that is not a digit."""
         chosen = self.choose(self.lines_with(*NUMBERS))
         return chosen and self.replace(chosen[1], value=parts(self.lines[chosen[1]])[2] + "O")
 

@@ -14,7 +14,7 @@ class Programs:
     """The programs under test, what helps to test them, and how they were built."""
 
     def use(self, build, cdgen=None, native="little"):
-        """Take the programs from a build directory; cdgen from elsewhere, if that is said."""
+        """Take the programs from a build directory, or cdgen from another place if one is given."""
         self.build = pathlib.Path(build).resolve()
         self.cdgen = pathlib.Path(cdgen).resolve() if cdgen else self.build / "cdgen"
         self.native = native  # the byte order of the machine that cdgen is for

@@ -296,7 +296,7 @@ def test_output_name_too_long(world):
 
 
 def test_output_read_only(world):
-    """A database that nobody may change stays."""
+    """A read-only database is not changed."""
     world.write(OUT, BEFORE)
     os.chmod(world.path(OUT), 0o444)
     with world.left_alone():
@@ -304,7 +304,7 @@ def test_output_read_only(world):
 
 
 def test_output_is_a_directory(world):
-    """A directory is no output, and stays."""
+    """A directory is refused as output and not changed."""
     world.path(OUT).mkdir()
     cannot_create(world, OUT, errno.EISDIR)
     check(world.path(OUT).is_dir(), "the directory is gone")

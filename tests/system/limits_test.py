@@ -94,7 +94,7 @@ KINDS = {
 
 
 def records(kind, count):
-    """A source with so many records of a kind."""
+    """A source with this many records of a kind."""
     body = kind + "\n" + KINDS[kind][2]
     return HEAD + "".join(body % i for i in range(count)).encode()
 
@@ -341,7 +341,7 @@ def test_header_of_254_characters(world):
 
 
 def test_no_final_newline(world):
-    """The last line counts all the same."""
+    """The last line counts too."""
     image = compiled(world, HEAD).contents
     check(compiled(world, HEAD[:-1]).contents == image, "another database")
 

@@ -32,7 +32,7 @@ inline std::string body_of(const std::string &section) {
     return section.substr(std::min(section.find("\n\n"), section.size()));
 }
 
-/* What it has to say. */
+/* What it must say. */
 inline std::string words(const std::string &cause, const std::string &cure) {
     return "\n\n**Cause**: " + cause + " **Cure**: " + cure + "\n";
 }

@@ -135,7 +135,7 @@ def test_leaves_the_same_database_alone(world):
 
 
 def test_replaces_another_database(world):
-    """A new file; whoever has the old one keeps it."""
+    """A new file; programs that have the old one open keep it."""
     made(world, "-o", OUT, SOURCE)
     old = open(world.path(OUT), "rb")
     world.write(SOURCE, HEAD + attributes(1))
@@ -225,7 +225,7 @@ def test_writes_no_nameless_class_to_standard_output(world):
 
 
 def all_of(terminal):
-    """What has been written to a terminal that nobody has open any more."""
+    """Everything that has been written to a terminal that is no longer open."""
     said = b""
     try:
         while more := os.read(terminal, 10000):
@@ -236,7 +236,7 @@ def all_of(terminal):
 
 
 def test_warns_of_classes_that_contradict_each_other(world):
-    """Each is right alone. Both databases are made all the same; with --werror, the status says so."""
+    """Each is correct alone. Both databases are made nevertheless; with --werror, the status is 1."""
     world.write("a.cdefsrc", HEAD)
     world.write("b.cdefsrc", HEAD.replace(b"FirstKey=1\n", b"FirstKey=50\n"))
     said = (b"b.cdefsrc:3: warning: the class `Disk` is also in a.cdefsrc:3 [S611 shared-name]\n"

@@ -36,7 +36,7 @@ def run(args, source, stdin=None):
 
 @pytest.mark.parametrize("name", sorted(path.stem for path in CASES.glob("*.expect")))
 def test_case(name):
-    """What is said of a source, by its name and as standard input."""
+    """The findings in a source, given by name and as standard input."""
     said = expected_of(CASES / f"{name}.expect")
     args, source = shlex.split(said.get("args")), CASES / f"{name}.cdefsrc"
     expected = (int(said.get("status", "0")), said.get("stdout"), with_summary(said.get("stderr")))
@@ -47,6 +47,6 @@ def test_case(name):
 
 
 def test_document():
-    """docs/check.md shows what is said of a source; unit tests compare docs/messages.md with the tables."""
+    """The example in docs/check.md; unit tests compare docs/messages.md with the tables."""
     example = with_summary(expected_of(CASES / "disk.expect").get("stderr"))
     assert f"```\n{example}```\n" in (PROJECT / "docs/check.md").read_text()

@@ -108,7 +108,7 @@ def test_other_forms(source):
 
 
 def test_dropped_correction(source):
-    """A correction that would bring more errors is not made, and that is said."""
+    """A correction that would cause more errors is not made, with a message."""
     source.write_bytes(SOUND.replace(b"ClassToManagerMapping", b"ClassToManagerMaping")
                        .replace(b"\tResourceManager=M\n", b"").replace(b"FirstKey=1", b"FirstKey=9"))
     before = source.read_bytes()

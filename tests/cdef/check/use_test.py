@@ -36,7 +36,7 @@ def check(*operands, stdin=subprocess.DEVNULL):
 
 
 def expected(source, shown=None):
-    """What is said of a case's source, under its own or another name."""
+    """The expected output for a case's source, under its own or another name."""
     text = Expectation((CASES / source).with_suffix(".expect"), ("status",), ("stderr",)).get("stderr")
     return text.replace(f"{source}:", f"{shown or source}:")
 
@@ -123,7 +123,7 @@ class ManyNames(unittest.TestCase):
 
 
 class TooMany(unittest.TestCase):
-    """What only the end of the source shows is told of the last line."""
+    """Findings that only the end of the source shows are reported at the last line."""
 
     def test_variable_classes(self):
         head, _, tail = (CASES / "variable-class-once.cdefsrc").read_text().partition("ResourceVariableClass\n")
@@ -155,7 +155,7 @@ class TooMany(unittest.TestCase):
 
 
 class Surroundings(unittest.TestCase):
-    """What is no fault of the source: streams and memory."""
+    """Errors that the source does not cause: streams and memory."""
 
     def test_standard_error_that_is_full(self):
         for source, status in ((ODD, 2), (WRONG, 2), (RIGHT, 0)):
@@ -239,7 +239,7 @@ class Editors(unittest.TestCase):
 
 
 class StandardInput(unittest.TestCase):
-    """Whatever it is, it is read from where it stands."""
+    """Standard input is read from its current position, whatever kind of file it is."""
 
     def test_file(self):
         with open(CASES / WRONG, "rb") as file:

@@ -229,7 +229,7 @@ def test_layout_is_not_compared(programs):
 
 
 def test_classes_are_named_where_there_are_several(programs):
-    """With two classes in one of the databases the class is said."""
+    """If one of the databases has two classes, the class is named."""
     control = "ControlDefinition\n\tFileVersion=1.0.0.0\n"
     resource = "ResourceClass\n\tDescription=1\n\tDisplayName=2\n\tProperties=CanDefine\n\tClassPermTemplate=0\n\tResourcePermTemplate=0\n"
     second = control + resource + "\tName=Second\n"
@@ -475,7 +475,7 @@ def test_mentions_in_json(programs):
 
 
 def test_references_that_are_never_set_may_be_none(programs):
-    """None is no other place than 0, where they lead by default."""
+    """"None" counts as the same place as 0, which is the default."""
     for order in make_images.ORDERS:
         # Of a dynamic attribute of the class, which stands at 368, and of the manager, at 1328.
         one, two = programs.image("small", order), programs.image("small", order, "u32 392 -1", "u32 1344 -1")

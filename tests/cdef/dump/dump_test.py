@@ -102,7 +102,7 @@ def dump(data, *options, status=OK, **settings):
 
 
 def expected_text(kind, name, order="little"):
-    """A case's expected text; its first line tells the byte order."""
+    """A case's expected text; its first line is the byte order."""
     return (CASES / kind / f"{name}.txt").read_text("utf-8").replace("little-endian", f"{order}-endian", 1)
 
 
@@ -153,7 +153,7 @@ def test_facts(name):
 
 @pytest.mark.parametrize("name", JSONS)
 def test_json(name):
-    """The JSON as it stands."""
+    """The JSON, compared as text."""
     expected = json.loads((CASES / "json" / f"{name}.json").read_text("utf-8"))
     actual = parsed(dump(database(name), "--json"))
     expect(actual, expected, "JSON")
@@ -282,7 +282,7 @@ def test_time_is_utc():
 
 
 def test_offsets_in_json():
-    """Each record tells where it is, and its references as they stand."""
+    """Each record has its place, and its references as numbers."""
     data = parsed(dump(database("minimal"), "--json", "--offsets"))
     expect(list(data["header"].items())[0], ("at", 0), "first member of the header")
     first = data["sections"][0]
@@ -291,7 +291,7 @@ def test_offsets_in_json():
 
 
 def test_offsets_of_lists():
-    """Lists and their entries, by the sizes of what stands in front of them."""
+    """The places of lists and their entries follow from the sizes of everything before them."""
     text = dump(database("odd"), "--offsets")
     # 160 the class; its lists of varieties begin 616 behind, each 16 bytes, the values at 736.
     for line in (

@@ -163,7 +163,7 @@ def test_looks_for_the_file_in_a_directory(world):
 
 
 def git(world, *arguments):
-    """A run of git, whoever the user is."""
+    """Runs git independently of the user's settings."""
     who = {f"GIT_{role}_{what}": "someone@example.com" for role in ("AUTHOR", "COMMITTER") for what in ("NAME", "EMAIL")}
     subprocess.run(["git", *arguments], cwd=world.path("."), check=True, stdout=subprocess.DEVNULL,
                    env={**os.environ, **who, "GIT_CONFIG_GLOBAL": "/dev/null", "GIT_CONFIG_NOSYSTEM": "1"})

@@ -105,14 +105,14 @@ def test_sarif():
 
 
 def test_sarif_folds_consequences(count):
-    """What follows is not lost, but is no result."""
+    """Consequences are kept, but not as results."""
     (result,) = sarif(count)["results"]
     same((result["ruleId"], result["message"]["text"]), ("CDB108", COUNT_TEXT), "cause")
     same(len(result["relatedLocations"]), consequences(count), "consequences")
 
 
 def test_sarif_of_files_that_cannot_be_read():
-    """They are no results."""
+    """They are not reported as results."""
     run = sarif(WRONG, "none.cdef")
     (invocation,) = run["invocations"]
     same((len(run["results"]), invocation["executionSuccessful"]), (1, False), "invocation")

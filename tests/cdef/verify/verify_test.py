@@ -332,7 +332,7 @@ class Input(unittest.TestCase):
 
 
 class Usage(unittest.TestCase):
-    """What is said of a wrong command line: what is not understood before what is missing."""
+    """Messages about a wrong command line: unknown options are reported before missing operands."""
 
     MESSAGES = {
         ("dmp", "FILE"): "dmp: unknown subcommand",

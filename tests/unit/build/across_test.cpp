@@ -1,4 +1,4 @@
-/* What contradicts itself in classes that are built together. */
+/* Conflicts between classes that are built together. */
 
 #include "build/across.h"
 

@@ -1,4 +1,4 @@
-/* Which databases are made of which sources. */
+/* Which databases are made from which sources. */
 
 #include "build/plan.h"
 

@@ -1,4 +1,4 @@
-/* What has been found: counted, taken back, and handed over in order. */
+/* Findings are counted, withdrawn, and passed on in order. */
 
 #include "check/findings.h"
 
@@ -31,7 +31,7 @@ protected:
     }
 
     std::vector<check::finding> given;
-    int open_line = 0; /* whose warnings may still be taken back */
+    int open_line = 0; /* whose warnings may still be withdrawn */
     findings found{[this](check::finding &&each) { given.push_back(std::move(each)); },
                    [this](check::warning_id, int line) { return line == open_line; }};
     check::totals count;

@@ -1,4 +1,4 @@
-/* Corrects what a program can correct. */
+/* The certain corrections of a source. */
 
 #include "check/fix.h"
 

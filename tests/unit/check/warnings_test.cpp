@@ -389,7 +389,7 @@ TEST(RangeElsewhere, IsReportedIfTheOtherKindIsCompletedFirst) {
     EXPECT_EQ(found_in(CLASS + dynamic(RESOURCE, "B", "1", "\tRange=0,2\n")), codes());
 }
 
-/* The mark that the second class attribute finds is that of the range before it. */
+/* The mark at the second class attribute comes from the range before it. */
 TEST(RangeElsewhere, FollowsTheMark) {
     std::vector<check::finding> found =
         found_in::findings_in(CLASS + dynamic(OF_CLASS, "A", "0", "\tRange=0,2\n") + dynamic(RESOURCE, "B", "1") +

@@ -81,7 +81,7 @@ const std::string TOO_EARLY = "Optional attribute discovered before all required
 const std::string TWICE = "Already defined. Duplicated definitions not allowed for ";
 const std::string MISSING = "Missing attribute value: ";
 
-/* In the order in which they are looked for: where two things are wrong, the first one is told. */
+/* In the order in which mistakes are looked for: if there are two, the first one is reported. */
 TEST(AttributeLine, IllFormedLinesAreRefused) {
     const std::string longest(1797, 'x');
     const refusal_row rows[] = {

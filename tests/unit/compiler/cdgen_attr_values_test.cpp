@@ -1,5 +1,5 @@
-/* What each type of attribute makes of its text, and where it goes. Elements of structured data have their own tests.
- */
+/* How each type of attribute converts its text, and where it stores the result. Elements of structured data have their
+ * own tests. */
 
 #include "compiler/cdgen_attr.h"
 #include "compiler/source_fixture.h"
@@ -415,7 +415,7 @@ TEST(Range, BoundsAreOfTheType) {
         }
 }
 
-/* Each bound is an array of its own, the upper one first. */
+/* Each bound is a separate array, the upper one first. */
 TEST(Range, ArraysBoundsAreArrays) {
     opened c;
     EXPECT_EQ(fed(c, SC_DYNAMIC_RESOURCE_ATTRIBUTE, "DataType=Float64Array"), WELL);

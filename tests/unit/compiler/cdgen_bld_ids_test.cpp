@@ -42,7 +42,7 @@ protected:
         return records;
     }
 
-    /* The class's strings begin with one that is nobody's name. */
+    /* The class's strings begin with one that is not the name of anything. */
     void add_class(const attributes &of_class, const attributes &of_resource) {
         tbl *strings = make_tbl(cx, 8192, "ClassStrings");
         add_text(strings, "Class");
@@ -184,7 +184,7 @@ TEST_F(VariableIds, UnknownNameIsDroppedInSilence) {
 
 TEST_F(VariableIds, NothingStagedIsNoError) {
     bld_var_id_tbls(cx);
-    append(&cx.sections.rsrc_class_tbl, rsrc_class_t{}); /* a class whose tables hold nothing */
+    append(&cx.sections.rsrc_class_tbl, rsrc_class_t{}); /* a class with empty tables */
     bld_var_id_tbls(cx);
     EXPECT_EQ(cx.variable_ids.tbl_entry_used, 0u);
 }

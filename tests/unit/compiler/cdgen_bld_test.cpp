@@ -148,7 +148,7 @@ TEST_F(ImageSize, MoreThan65535RecordsOfOneKindAreRefused) {
 }
 
 #if SIZE_MAX > UINT32_MAX /* a machine of 32 bits has no such tables */
-/* Address space for tables that are too large to exist. Whoever uses it takes it back from the table. */
+/* Address space for tables that are too large to exist. The test takes it back from the table. */
 class vast_table {
 public:
     explicit vast_table(tbl *use) : t(use), start(mmap(nullptr, SIZE, PROT_NONE, FLAGS, -1, 0)) {

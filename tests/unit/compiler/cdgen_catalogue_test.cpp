@@ -106,7 +106,7 @@ const attr_rows ACTION = {
     {"TimeOut", 1, offsetof(rsrc_action_t, ac_timeout), 0x80000002, false},
 };
 
-/* An element is staged behind 8 bytes of header. */
+/* An element is staged after 8 bytes of header. */
 const attr_rows ELEMENT = {
     {"ElementName", 22, 8 + offsetof(sd_field_t, u_sd_field_name), 0x1, false},
     {"Description", 23, 8 + offsetof(sd_field_t, sd_dscr_msgid), 0x2, false},

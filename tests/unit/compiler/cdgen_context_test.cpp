@@ -63,11 +63,11 @@ TEST_F(Context, RefusedOptionIsForgotten) {
     std::string program = "cdgen", options = "-xn";
     char *argv[] = {program.data(), options.data(), nullptr};
     EXPECT_EQ(cdgen_main(2, argv), 1);
-    options = "-qq"; /* what a parser that remembers would go on with */
+    options = "-qq"; /* what a parser that keeps state would continue with */
     EXPECT_EQ(run(minimal, "after.cdef"), 0);
 }
 
-/* Where there is no memory even for the exception that would say so. */
+/* If there is no memory even for the exception. */
 TEST(Process, WithoutMemoryEndsWithTheSystemsStatus) {
     auto take_and_terminate = [] {
         take_process();

@@ -10,7 +10,7 @@
 namespace {
 
 std::optional<uint64_t> number(const std::string &text) {
-    std::string exact(text.data(), text.size()); /* what is behind it does not belong to it */
+    std::string exact(text.data(), text.size()); /* the characters after it do not belong to it */
     uint64_t value = 0;
     return all_digits(exact, &value) ? std::optional(value) : std::nullopt;
 }

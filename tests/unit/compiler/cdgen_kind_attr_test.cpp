@@ -258,7 +258,7 @@ TEST(PersistentAttribute, CannotBeDefinedUnlessItSaysSo) {
         }
 }
 
-/* Whatever stands in the record. A group of 0 is one. */
+/* Whatever is in the record. A group of 0 is a group. */
 template <class Record> void expect_no_group_unless_given(const kind_row<Record> &kind) {
     const std::pair<std::vector<std::string>, std::pair<int, int>> rows[] = {
         {{}, {255, 0}}, {{"Properties=Public"}, {255, 0}}, {{"GroupID=0"}, {0, 0}}, {{"GroupName=9"}, {255, 9}}};
@@ -362,7 +362,7 @@ TEST(DynamicAttribute, RangeAndInitialValueAreItsTypes) {
         }
 }
 
-/* Two bounds, each an array of its own with one element. */
+/* Two bounds, each a separate array of one element. */
 TEST(DynamicAttribute, ArraysBoundsAreArrays) {
     const std::pair<const char *, std::pair<vx_uint64_t, vx_uint64_t>> rows[] = {
         {"Int32Array", {0, cell32(100)}},
@@ -444,7 +444,7 @@ TEST(PersistentAttribute, DefaultIsTheResourceKindsLastValue) {
     EXPECT_EQ(text.string_at(8), "some,text");
 }
 
-/* Deliberate: they are read and checked, and that is all. */
+/* Deliberate: they are only read and checked. */
 TEST(PersistentAttribute, ClassKindsDefaultValuesAreNotUsed) {
     compilation number, text;
     EXPECT_EQ(completed_pattr(number, PC, "Int32", {"DefaultValue=5"}).ra_dflt_value.val_uint64, 0U);

@@ -348,7 +348,7 @@ TEST(Run, OfAnAttributeMakesItsValue) {
         EXPECT_EQ(attr.ra_max_sd_idx, 1U);
         EXPECT_EQ(attr.u_ra_sd.offset[0], 0U);
         EXPECT_EQ(c.elements_at(attr.u_ra_sd).size(), 2U);
-        EXPECT_EQ(attr.ra_dflt_value.val_uint64, cell32(24)); /* behind its name and those of the elements */
+        EXPECT_EQ(attr.ra_dflt_value.val_uint64, cell32(24)); /* after its name and those of the elements */
         EXPECT_EQ(c.string_table_at<vx_uint32_t>(24), 2U);
         auto first = c.string_table_at<vx_structured_data_element_t>(32);
         auto second = c.string_table_at<vx_structured_data_element_t>(48);
@@ -380,7 +380,7 @@ TEST(Run, OfADynamicAttributeMakesItsInitialValue) {
     }
 }
 
-/* Which of the two kinds of run stands behind an attribute is not looked at. */
+/* The compiler does not check which of the two kinds of run follows an attribute. */
 TEST(Run, MayBeOfTheOtherAttributeKind) {
     compilation c;
     c.read(CLASS + dattr("DynamicResourceAttribute", "SD") + element("PAttrSDDefinition", 0, "Int32") +
@@ -466,7 +466,7 @@ TEST(CollectedValues, MayBeNone) {
     EXPECT_EQ(strings.used(), 0U);
 }
 
-/* Each element of an array type has an array of its own. */
+/* Each element of an array type has a separate array. */
 TEST(CollectedValues, ElementsOfArrayTypesHaveArraysOfTheirOwn) {
     compilation c;
     tbl strings(64, "strings");

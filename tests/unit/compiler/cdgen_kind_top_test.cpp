@@ -207,11 +207,11 @@ TEST(ResourceClass, TakesNoClosedAttributes) {
             << row.name;
 }
 
-/* A flushed attribute refers to the first valid-value list if it has none of its own. */
+/* An attribute that was cut short refers to the first list of valid values if it has no list. */
 TEST(ResourceClass, RemembersFlushedAttributesWithoutAList) {
     opened c;
     c.cx.sections.rsrc_class_count = 6;
-    cmplt_class_tbl(c.cx); /* the persistent class kind says from the start that it has none */
+    cmplt_class_tbl(c.cx); /* in the persistent class kind the reference is "none" from the start */
     ASSERT_EQ(c.cx.stray.strays.size(), 3U);
     const std::pair<cdb_ref_t rsrc_class_t::*, size_t> rows[] = {
         {&rsrc_class_t::u_rc_dattrsC, 64}, {&rsrc_class_t::u_rc_pattrs, 48}, {&rsrc_class_t::u_rc_dattrs, 64}};

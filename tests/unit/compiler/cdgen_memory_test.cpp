@@ -8,7 +8,7 @@ namespace {
 
 class LargeTables : public ::testing::Test {
 protected:
-    /* Reserves 8-byte cells up to so many bytes; each holds its number. */
+    /* Reserves 8-byte cells up to this many bytes; each contains its number. */
     void fill(tbl &t, size_t bytes) {
         for (size_t at = t.used(); at < bytes; at += sizeof at)
             memcpy(alloc_tble(cx, &t, sizeof at), &at, sizeof at);

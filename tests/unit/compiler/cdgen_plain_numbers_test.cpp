@@ -116,7 +116,7 @@ std::string written(const char *form, double number) {
     return text;
 }
 
-/* A number of which a Float, the one after it, or the middle between them is the nearest: all its digits, or a few. */
+/* A number near a Float, near the next Float, or near the middle between them, with all its digits or only some. */
 template <class Float> std::string close_to(std::mt19937_64 &random) {
     std::conditional_t<sizeof(Float) == 4, uint32_t, uint64_t> pattern = 0;
     pattern = static_cast<decltype(pattern)>(random());

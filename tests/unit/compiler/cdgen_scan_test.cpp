@@ -36,7 +36,8 @@ void expect_bits_of(const char *bytes) {
     EXPECT_EQ(word_marks, marks);
 }
 
-/* Bytes of which one in `rarity` is one that lines and comments depend on, or differs from one in few bits. */
+/* Random bytes. One in `rarity` is a byte that lines and comments depend on, or differs from such a byte in few bits.
+ */
 std::string random_bytes(std::mt19937 &random, size_t size, unsigned rarity) {
     constexpr std::string_view CLOSE("\n\"#/\0.\x0b!\x01\x8a\xa3\xaf\x80", 13);
     std::string bytes(size, 'x');

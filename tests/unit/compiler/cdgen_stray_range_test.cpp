@@ -1,5 +1,5 @@
-/* A range of a class attribute that landed in a resource attribute of another type is a number where a reference would
- * be. Reversing the database must not follow it, wherever it seems to lead. */
+/* A range of a class attribute that was stored in a resource attribute of another type is a number in the place of a
+ * reference. The reversal must not follow it, wherever it seems to lead. */
 
 #include "compiler/cdgen.h"
 
@@ -74,7 +74,7 @@ TEST_P(StrayRange, DoesNotTurnText) {
                          attribute("DynamicClassAttribute", "Int32", "\tRange=8,16\n");
     bool is_binary = GetParam() == std::string("Binary");
     for (size_t classes : {1U, 2U}) {  /* completed, and cut short by another class */
-        if (is_binary && classes == 1) /* whose completion leaves it without bounds */
+        if (is_binary && classes == 1) /* which gets no bounds when it is completed */
             continue;
         std::string whole = source + (classes == 2 ? HEAD : "") + TAIL;
         std::string native = compiled(whole, "-n"), turned = compiled(whole, "-s");

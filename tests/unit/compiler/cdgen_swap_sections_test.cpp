@@ -280,7 +280,7 @@ TEST(SwapSection, TooShortForItsRecordStaysButForItsAnchor) {
     const section_row rows[] = {{3, 23}, {4, 39}, {5, 223}, {6, 59}, {7, 8199}, {5, 0}};
     for (const section_row &row : rows) {
         SCOPED_TRACE(row.type);
-        image given = image_of({row, {0, 300}}); /* with another section's bytes behind it */
+        image given = image_of({row, {0, 300}}); /* followed by another section's bytes */
         expect_reversed(given, given, 2);
     }
 }
@@ -390,7 +390,7 @@ TEST(SwapClass, ListsAndValuesThatNothingRefersToStay) {
     expect_reversed(expected, given);
 }
 
-/* A persistent attribute's reference to a list of one entry, which stands in front of more of the section. */
+/* A persistent attribute's reference to a list of one entry, which is not the last in the section. */
 TEST(SwapClass, ListBeyondItsTableIsNotFollowed) {
     const struct {
         const char *what;
@@ -422,7 +422,8 @@ TEST(SwapClass, ValueBeyondTheSectionIsNotFollowed) {
     expect_reversed(expected, given, 2);
 }
 
-/* An attribute whose reference to valid values was never set holds 0, where there may be another's list. */
+/* An attribute whose reference to valid values was never set has 0 there, which may be the place of another attribute's
+ * list. */
 TEST(SwapClass, PlacesThatLeadNowhereAreNotFollowedAndKeepTheirZero) {
     image given = class_image({144, 0, 0, 32, 0});
     size_t attr = SECTION + 224, list = attr + 144;
@@ -440,7 +441,7 @@ TEST(SwapClass, PlacesThatLeadNowhereAreNotFollowedAndKeepTheirZero) {
 
 /* ---- Images ---------------------------------------------------------------------------------------------------- */
 
-/* Map sections of 60 bytes and their strings shift all behind them, here a class with 8-byte values, by 4. */
+/* Map sections of 60 bytes and their strings shift everything after them, here a class with 8-byte values, by 4. */
 TEST(SwapImage, SectionsAlignedToFourAreReversed) {
     image given = image_of({{6, 60}, {5, 224 + 72 + 120}, {3, 24}, {6, 68}, {4, 40 + 8 + 8}});
     size_t map = 160, cls = map + 60, attr = cls + 224, strings = attr + 72, mgr = strings + 120, vars = mgr + 24 + 68;
@@ -457,7 +458,7 @@ TEST(SwapImage, SectionsAlignedToFourAreReversed) {
     expect_reversed(expected, given, 5);
 }
 
-/* 82 bytes: the last two are no whole word. */
+/* 82 bytes: the last two are not a whole word. */
 TEST(SwapImage, TrailingPartWordIsNotInTheChecksum) {
     image given(82);
     given.u32(0, 78).u32(24, 0);

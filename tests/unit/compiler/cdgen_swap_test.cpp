@@ -118,13 +118,13 @@ TEST(SwapValue, NoneAndUnfilledCellsAreNotFollowed) {
         }
 }
 
-/* A value of which something lies outside the string table, or that is out of line. */
+/* A value that is partly outside the string table, or that is out of line. */
 struct edge_row {
     const char *what;
     vx_uint32_t type;
     size_t size; /* of the string table */
     vx_uint32_t offset;
-    vx_uint32_t length; /* what stands at the offset */
+    vx_uint32_t length; /* the contents at the offset */
 };
 
 void put_edge(cell_and_strings &given, const edge_row &row) {

@@ -13,7 +13,7 @@
 #include <malloc.h>
 #endif
 
-/* A sanitized build ends at a request that cannot be met, unless it is told that this is expected here. */
+/* A sanitized build ends the process if memory is refused, unless it knows that this is expected here. */
 extern "C" const char *__asan_default_options();
 extern "C" const char *__asan_default_options() {
     return "allocator_may_return_null=1";
@@ -26,7 +26,7 @@ namespace {
 /* Bytes that no process can have beside its own, and a power of 2 as single precision wants it. */
 constexpr size_t ABSURD = size_t{1} << (sizeof(size_t) > 4 ? 62 : 31);
 
-/* Memory comes dirty, so that a byte that nobody zeroes shows. */
+/* New memory is filled with other bytes than zeros, so that a byte that is not cleared is noticed. */
 class Tables : public testing::Test {
 protected:
     Tables() {

@@ -310,7 +310,7 @@ TEST(Texts, MustNotBeEmpty) {
         EXPECT_EQ(convert(cx, type_of_code(code), ""), -1) << code;
 }
 
-/* Escaped text begins where the length stands: its first four bytes are lost under it, deliberately. */
+/* Escaped text begins at the place of the length, so its first four bytes are overwritten, deliberately. */
 TEST(Binaries, AreHexadecimalAfterAZeroElseEscaped) {
     const row<std::string> taken[] = {{"0x0aFF", bytes().u32(2).text("\x0A\xFF").all},
                                       {"0xabcdefABCDEF", bytes().u32(6).text("\xAB\xCD\xEF\xAB\xCD\xEF").all},

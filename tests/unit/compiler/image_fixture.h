@@ -17,7 +17,7 @@ namespace by_hand {
 
 constexpr std::uint32_t NONE = 0xFFFFFFFF;
 
-/* Where a number stands, and its bytes. */
+/* The offset of a number, and its bytes. */
 struct number {
     std::size_t at;
     std::size_t width;
@@ -54,7 +54,7 @@ public:
         return *this;
     }
 
-    /* Those of a record that stands at an offset. */
+    /* The numbers of a record at an offset. */
     image &turn(const numbers &of_record, std::size_t record = 0) {
         for (const number &n : of_record)
             turn(record + n.at, n.width);
@@ -74,7 +74,7 @@ public:
     std::vector<char> bytes;
 };
 
-/* Says where two images differ. */
+/* Reports where two images differ. */
 inline testing::AssertionResult same(const image &expected, const image &actual) {
     std::string places;
     if (expected.bytes.size() != actual.bytes.size())
@@ -87,7 +87,7 @@ inline testing::AssertionResult same(const image &expected, const image &actual)
 
 /* ---- Values ---------------------------------------------------------------------------------------------------- */
 
-/* What stands in a cell of a type, and which numbers the reversal turns. */
+/* The contents of a cell of a type, and the numbers that the reversal turns. */
 struct value_row {
     const char *name;
     std::uint32_t type;
@@ -197,7 +197,7 @@ struct section_row {
     std::size_t length;
 };
 
-/* Where the sections of an image start: header, anchors, and then one behind the other. */
+/* Where the sections of an image start: header, anchors, and then the sections one after the other. */
 inline std::size_t section_at(const std::vector<section_row> &sections, std::size_t n) {
     std::size_t at = 80 + 16 * sections.size();
     for (std::size_t i = 0; i < n; ++i)

@@ -1,4 +1,4 @@
-/* util_fixture.h: what the tests of the tables, values and serialisation share. */
+/* util_fixture.h: helpers for the tests of tables, values and serialisation. */
 #ifndef CDGEN_TESTS_UTIL_FIXTURE_H
 #define CDGEN_TESTS_UTIL_FIXTURE_H
 
@@ -16,7 +16,7 @@
 
 namespace util_test {
 
-/* Bytes as they stand in a table: numbers in the machine's order. */
+/* Bytes as they are in a table: numbers in the machine's order. */
 class bytes {
 public:
     bytes &u16(vx_uint16_t n) {
@@ -54,7 +54,7 @@ private:
     }
 };
 
-/* What stands at an address. */
+/* The contents at an address. */
 inline std::string bytes_at(const void *p, size_t n) {
     return {static_cast<const char *>(p), n};
 }
@@ -77,7 +77,7 @@ inline void PrintTo(const ending &e, std::ostream *out) {
     *out << '"' << e.text << "\", line " << e.line << ", status " << e.code;
 }
 
-/* Nothing if the call returns. */
+/* No value if the call returns. */
 template <class Call> std::optional<ending> ending_of(Call call) {
     try {
         call();
@@ -180,13 +180,13 @@ struct serial {
     int copy_sd(vx_data_type_t type, int mode, vx_uint32_t count, vx_data_type_t sd_type = VX_SD_PTR) {
         return copy_this_sd_type(cx, &out, type, mode, &strings, &anchors, count, sd_type);
     }
-    /* What stands in the table behind the first eight bytes. */
+    /* The contents of the table after the first eight bytes. */
     std::string added() const {
         EXPECT_EQ(contents(strings).substr(0, 8), std::string("earlier", 8));
         return contents(strings).substr(8);
     }
 
-    /* The cell, and what stands in the table. */
+    /* The cell, and the contents of the table. */
     std::string written() const {
         return bytes_at(&out, sizeof out) + added();
     }

@@ -1,4 +1,4 @@
-/* The field tables against a second statement, by hand, of what becomes of each field in a reversed file. */
+/* Compares the field tables with a second list, written by hand, of how each field is reversed. */
 
 #include "cdb_fields.h"
 
@@ -49,7 +49,7 @@ constexpr record records[] = {
     {"element", cdb::structured_data_element_fields, 16, 3},
 };
 
-/* A field that is no plain number. */
+/* A field that is not a plain number. */
 struct special {
     std::string_view record;
     std::string_view name;
@@ -176,7 +176,7 @@ constexpr special specials[] = {
     value("element", "value", 0),
 };
 
-/* What the statement says of a field; null if it is a plain number. */
+/* The row of the second list for a field; null if it is a plain number. */
 const special *special_of(std::string_view record_name, std::string_view name) {
     const auto *found = std::ranges::find_if(
         specials, [&](const special &row) { return row.record == record_name && row.name == name; });

@@ -1,5 +1,5 @@
-/* The records of the two format headers against the format as written down: where each member stands, how many bytes it
- * has, and the value of each code. */
+/* Compares the records of the two format headers with a second list: the offset and size of each member, and the value
+ * of each code. */
 
 #include "cdb.h"
 

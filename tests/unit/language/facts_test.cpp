@@ -1,4 +1,4 @@
-/* The catalogue and the facts of fields say the same of which lines fill which fields. */
+/* The catalogue and the facts about fields agree on which lines fill which fields. */
 
 #include "language/fields.h"
 

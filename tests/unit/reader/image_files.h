@@ -34,8 +34,8 @@ inline std::vector<std::byte> load(std::string_view name, std::endian order) {
     return contents;
 }
 
-/* Bytes in memory that is not a byte larger, and that begin so many bytes off an aligned place: a sanitizer sees the
- * first byte that is read outside of them. */
+/* Bytes at a given distance from an aligned address, in memory of exactly their size, so that a sanitizer notices
+ * reading outside of them. */
 class exact_copy {
 public:
     explicit exact_copy(std::span<const std::byte> of, std::size_t off = 0)

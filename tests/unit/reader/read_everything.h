@@ -12,7 +12,7 @@
 
 namespace reading {
 
-/* Adds up what it reads, so that nothing is left out because nobody looks. */
+/* Adds up what it reads, so that the compiler cannot leave out reading. */
 class everything {
 public:
     /* deep: values inside values too, to the end. Only for a sound database: in an unsound one a value may stand inside

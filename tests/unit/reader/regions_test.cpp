@@ -40,7 +40,7 @@ std::vector<document_row> document_rows() {
     return rows;
 }
 
-/* What stands between the first two marks. */
+/* The text between the first two marks. */
 std::string between(const std::string &text, char mark) {
     std::size_t start = text.find(mark) + 1;
     return text.substr(start, text.find(mark, start) - start);
@@ -140,7 +140,7 @@ TEST(CdbRegions, ListsAndTheirEntries) {
     expect_regions("whole", 0, entries);
 }
 
-/* Behind the second one's length there is no piece of its own: a text follows. */
+/* The second one has no separate piece after its length: a text follows. */
 TEST(CdbRegions, EmptyBinaries) {
     constexpr expected_region pieces[] = {
         {504, 4, "length", 0, ""},  {508, 4, "filling", 0, ""}, {512, 8, "filling", 0, ""}, {520, 4, "length", 0, ""},

@@ -1,5 +1,5 @@
 /* verify(): each rule against an image with one thing wrong (tests/image/broken, with the expected findings beside the
- * change), images that nothing is wrong with, and damage of every kind. */
+ * change), sound images, and damage of every kind. */
 
 #include "cdb_view.h"
 
@@ -122,8 +122,8 @@ TEST(CdbVerify, DocumentsImageIsSound) {
     EXPECT_EQ(load("plain", std::endian::little), load("document", std::endian::little));
 }
 
-/* Each text has a piece of its own, its zero byte included: one that runs into the next text, or into a value, is not
- * sound. The pieces of "el" and "in" have 8 bytes each; behind them stands a binary. */
+/* Each text has a separate piece, which includes its zero byte. A text that runs into the next text, or into a value,
+ * is not sound. The pieces of "el" and "in" have 8 bytes each; a binary follows them. */
 TEST(CdbVerify, TextThatRunsIntoWhatFollowsIsUnsound) {
     for (std::size_t piece : {1160u, 1168u})
         for (std::endian order : both_orders) {

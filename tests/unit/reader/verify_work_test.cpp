@@ -187,7 +187,7 @@ TEST(CdbVerifyWork, OverlappingLists) {
     EXPECT_EQ(findings.size(), 499u + 499u); /* and the name that all have */
 }
 
-/* The same from the end: each list overlaps the ones behind it, and claims 8 bytes before it sees so. */
+/* The same from the end: each list overlaps the ones after it, and claims 8 bytes before that is noticed. */
 TEST(CdbVerifyWork, OverlappingListsFromTheEnd) {
     words varieties;
     for (std::uint32_t i = 0; i < 500; ++i)
@@ -247,7 +247,7 @@ TEST(CdbVerifyWork, ManyCellsOfOneValue) {
     EXPECT_EQ(count_of(findings, "CDB403"), 999u + 2u); /* and the elements' names */
 }
 
-/* Names without end: that there is no zero byte is seen once, from the end of the strings. */
+/* Names without a zero byte: that there is none is found out once, from the end of the strings. */
 TEST(CdbVerifyWork, ManyNamesWithoutEnd) {
     words strings(1000, 0x41414141);
     parts p = {.attributes = 500,
@@ -333,7 +333,7 @@ testing::AssertionResult unsound_or_read_to_the_end(const std::vector<std::byte>
     return testing::AssertionFailure() << "sound, but holds more values than it has room for";
 }
 
-/* A bound may be a range of another attribute's type, which is no error; what it leads to must not be one either. */
+/* A bound may be a range of another attribute's type, which is not an error; neither is the place that it leads to. */
 TEST(CdbVerifyWork, BoundsThatShareStructures) {
     EXPECT_TRUE(unsound_or_read_to_the_end(file_of({.attribute = dynamic(VX_SD_PTR, 8),
                                                     .varieties = {0x43444267, 1, 1, 1},
@@ -342,7 +342,7 @@ TEST(CdbVerifyWork, BoundsThatShareStructures) {
                                                     .strings = twice_each(60)})));
 }
 
-/* Likewise valid values of an attribute that was cut short: they may be another's. */
+/* The same for valid values of an attribute that was cut short, which may belong to another attribute. */
 TEST(CdbVerifyWork, ValidValuesThatShareStructures) {
     words first = class_of({.attribute = persistent(VX_SD_PTR, NONE, 0, 0, NONE, 0xFFFF),
                             .varieties = {0x43444267, 1, 1, 1},
@@ -357,8 +357,8 @@ TEST(CdbVerifyWork, ValidValuesThatShareStructures) {
     EXPECT_TRUE(unsound_or_read_to_the_end(file_of({first, second}, 2)));
 }
 
-/* A text that runs into the next one has no end of its own: were it sound, reading all names would take time in
- * proportion to their number times their length. */
+/* A text that runs into the next one is not sound. Otherwise reading all names could take time proportional to their
+ * number times their length. */
 TEST(CdbVerifyWork, NamesThatRunIntoOneAnother) {
     words strings(1000, 0x41414141);
     strings.back() = 0;

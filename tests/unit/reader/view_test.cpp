@@ -1,5 +1,5 @@
-/* The views: every field and every accessor over the hand-made image tests/image/whole.image, which has a number of its
- * own in each field; in both byte orders and from every alignment. Values have a test of their own. */
+/* The views: every field and every accessor over the hand-made image tests/image/whole.image, which has a different
+ * number in each field; in both byte orders and from every alignment. Values have a test of their own. */
 
 #include "cdb_view.h"
 

@@ -1,4 +1,4 @@
-/* The forms in which findings are written, and what tells findings from each other. */
+/* The forms in which findings are written, and their fingerprints. */
 
 #include "report/fingerprint.h"
 #include "report/report.h"

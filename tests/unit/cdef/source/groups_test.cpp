@@ -21,7 +21,7 @@ TEST(SourceGroups, OfEqualIdsTheFirstIsTaken) {
     EXPECT_EQ(deal_out(ids{7, 7}, lists{{7}}), (owners{0, NOWHERE}));
 }
 
-/* The first 7 goes to the list that continues with 5, although the other one also waits for it. */
+/* The first 7 goes to the list that continues with 5, although it would also fit the other list. */
 TEST(SourceGroups, AWrongChoiceIsTakenBack) {
     EXPECT_EQ(deal_out(ids{7, 5, 7}, lists{{7}, {7, 5}}), (owners{1, 1, 0}));
 }

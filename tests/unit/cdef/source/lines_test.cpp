@@ -79,7 +79,7 @@ TEST(SourceLines, PropertiesAreNames) {
     EXPECT_THROW(properties_text(0x5, known, ""), no_source_error);
 }
 
-/* Whoever adds an attribute that does not read as its field has to write its lines. */
+/* An attribute whose line differs from the text of its field needs a special function. */
 TEST(SourceLines, EachAttributeThatFillsAFieldIsWritten) {
     for (std::size_t i = 0; i < SC_COUNT; ++i) {
         auto stanza = static_cast<stanza_id>(i);

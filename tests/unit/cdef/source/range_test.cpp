@@ -66,7 +66,7 @@ TEST(SourceRange, NothingGivesBoundsToACompletedAttributeThatKeepsNone) {
     EXPECT_TRUE(find_range_lines({attributes({int32(0, 100)}, {text}, {OF_RESOURCE, OF_CLASS})}));
 }
 
-/* A class attribute keeps bounds of its own only if no resource attribute is open, so it has to come first. */
+/* A class attribute keeps its own bounds only if no resource attribute is open, so it must come first. */
 TEST(SourceRange, KindsChangePlacesIfTheyMust) {
     dynamic_attributes both =
         attributes({int32(1, 2), int32(0, 100)}, {int32(0, 100)}, {OF_RESOURCE, OF_CLASS, OF_CLASS});
@@ -86,7 +86,7 @@ TEST(SourceRange, AnAttributeCutShortKeepsItsBoundsWithoutDefault) {
     EXPECT_EQ((*found)[0].of_resource, lines{"0,100"});
 }
 
-/* Lines of types that are no numbers have no effect. */
+/* Lines of types that are not numbers have no effect. */
 TEST(SourceRange, BoundsThatNoLineGivesCannotBeHad) {
     range stubborn = int32(5, 6);
     stubborn.takes_line = false;

@@ -1,4 +1,4 @@
-/* What a structure tells about the run of SD stanzas that it came from. */
+/* What a structure shows about the run of SD stanzas that it came from. */
 
 #include "cdef/source/runs.h"
 #include "format/constants.h"

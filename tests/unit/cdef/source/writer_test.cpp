@@ -1,4 +1,4 @@
-/* The text of a source in the making. */
+/* Writing the text of a source. */
 
 #include "cdef/source/writer.h"
 

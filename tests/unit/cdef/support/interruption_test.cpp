@@ -1,4 +1,4 @@
-/* Signals wait for work that they must not cut in two. */
+/* Signals are held back during work that must not be interrupted. */
 
 #include "cdef/support/interruption.h"
 
@@ -30,7 +30,7 @@ bool is_ended_by(int status, int signal) {
     return WIFSIGNALED(status) && WTERMSIG(status) == signal;
 }
 
-/* The write end of a pipe tells that work came to its end. */
+/* The write end of a pipe reports that the work has ended. */
 struct Interruption : testing::Test {
     void SetUp() override {
         ASSERT_EQ(pipe(ends), 0);

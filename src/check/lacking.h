@@ -1,4 +1,4 @@
-/* lacking.h: what a stanza lacks without the compiler's noticing. */
+/* lacking.h: the missing attributes that the compiler does not notice. */
 #ifndef CDGEN_CHECK_LACKING_H
 #define CDGEN_CHECK_LACKING_H
 
@@ -7,8 +7,8 @@
 
 namespace check {
 
-/* The required attributes that the current stanza lacks at its end and that the compiler does not ask for. Nothing if
- * an error of the stanza that has been reported, or will be, may explain it. */
+/* The required attributes that are missing at the end of the current stanza without an error of the compiler. Empty if
+ * another error of the stanza, reported already or later, may explain that. */
 language::name_list lacking_unnoticed(const view &see, int next_kind);
 
 } // namespace check

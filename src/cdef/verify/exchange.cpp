@@ -164,7 +164,7 @@ public:
     void end_file() override {}
 
 protected:
-    /* mark: tells the finding from others about the file. hidden: how many consequences are not shown. */
+    /* mark: distinguishes the finding from others about the file. hidden: how many consequences are not shown. */
     virtual void add(const std::string &name, const cdb::finding &f, const std::string &mark, std::size_t hidden) = 0;
 
 private:

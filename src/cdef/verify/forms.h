@@ -20,7 +20,7 @@ public:
 
     virtual void begin_file(const std::string &name, bool sound) = 0;
     virtual void add(const std::vector<cdb::diagnosed> &findings) = 0;
-    /* Instead, if there are so many that nobody looks for their causes: says so, and each is added by itself. */
+    /* Used instead if there are too many findings to look for causes: says so, and each finding is added separately. */
     virtual void begin_many(std::size_t count) = 0;
     virtual void add_one(const cdb::finding &found) = 0;
     virtual void end_file() = 0;

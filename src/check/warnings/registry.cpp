@@ -82,7 +82,7 @@ constexpr row rows[] = {
      make_same_id},
     {{SAME_NAME, "S506", "same-name", "two names are the same, but for case",
       "Two attributes, actions or elements of one kind, or two variable classes, have the same name, or names that "
-      "differ only in case. Or a persistent and a dynamic attribute of a resource, or of the class, have.",
+      "differ only in case. Or this is true of a persistent and a dynamic attribute of a resource, or of the class.",
       "Rename one."},
      make_same_name},
     {{RANGE_ELSEWHERE, "S503", "range-elsewhere", "a Range does not reach its attribute",
@@ -115,12 +115,12 @@ constexpr row rows[] = {
      make_comment_in_value},
     {{NO_RESOURCE_CLASS, "S523", "no-resource-class", "a class has no ResourceClass",
       "No `ResourceClass` follows a `ControlDefinition`, so the class has no properties, no message "
-      "numbers and no name of its own. One in front of the first `ControlDefinition` is cleared by it.",
+      "numbers and no name of its own. A `ResourceClass` before the first `ControlDefinition` has no effect.",
       "Add a `ResourceClass` after the `ControlDefinition`."},
      make_no_resource_class},
     {{SECOND_RESOURCE_CLASS, "S524", "second-resource-class", "a class has two ResourceClass stanzas",
-      "A class has a second `ResourceClass`. It goes into the same record: what both give is replaced, "
-      "and properties are added.",
+      "A class has a second `ResourceClass`. It fills the same record: values that both give are replaced, and "
+      "properties are added.",
       "Combine the two stanzas."},
      make_second_resource_class},
     {{OVERRIDDEN, "S525", "overridden", "a line replaces an earlier one",
@@ -163,14 +163,14 @@ constexpr row rows[] = {
      make_properties},
     {{INVALID_DEFAULT, "S533", "invalid-default", "a default is not valid itself",
       "A `DefaultValue` or `InitialValue` is not among the valid values of its attribute, or is outside its `Range`. "
-      "Without such a line, that is said of the default of the type: 0 or an empty text, or one such element of an "
-      "array. It is not said of an attribute with `ReqdForDefine`, which needs no default. Elements of structured "
+      "Without such a line, the default of the type is checked: 0 or an empty text, or one such element of an array. "
+      "An attribute with `ReqdForDefine` is not checked, because it needs no default. Elements of structured "
       "data have no defaults of their own.",
       "Choose a default that is allowed, or allow it."},
      make_invalid_default},
     {{CLASS_BIT, "S534", "class-bit", "an Id has the bit of class attributes",
       "The `Id` of a dynamic attribute in a variable class has bit 0x8000, which is added there to the Ids of class "
-      "attributes to tell them from those of resources.",
+      "attributes to distinguish them from those of resources.",
       "Choose an `Id` below 32768."},
      make_class_bit},
     {{OUTER_BLANK, "S536", "outer-blank", "a text begins or ends with a blank",
@@ -221,7 +221,7 @@ constexpr row rows[] = {
       "Correct the name, or define the variable class."},
      make_unknown_variable_class},
     {{NO_NAME, "S601", "no-name", "a class is called after its database",
-      "A class has no `Name`, so it is called what its database is called in front of `.cdef`, directory and all. "
+      "A class has no `Name`, so it is named after its database: the path up to `.cdef`, with the directory. "
       "Only `cdef build` reports it, because it knows the database.",
       "Give the `ResourceClass` a `Name`."},
      make_no_name},
@@ -229,8 +229,8 @@ constexpr row rows[] = {
       "Two classes that are built together have the same name.", "Give one of them another name."},
      make_nothing},
     {{SHARED_KEYS, "S612", "shared-keys", "the keys of two classes overlap",
-      "Two classes that are built together have the same `MessageCatalog`, and there are keys that are at least their "
-      "`FirstKey` and at most their `LastKey`.",
+      "Two classes that are built together have the same `MessageCatalog`, and their ranges of keys, from `FirstKey` "
+      "to `LastKey`, overlap.",
       "Give each class keys of its own."},
      make_nothing},
     {{OTHER_MANAGER, "S613", "other-manager", "a message catalog has two managers",

@@ -85,7 +85,8 @@ int format_all(const format_options &options) {
 
 void add_format(CLI::App &app, int &status) {
     auto options = std::make_shared<format_options>();
-    CLI::App *command = app.add_subcommand("format", "Gives sources their usual form, and never another meaning");
+    CLI::App *command =
+        app.add_subcommand("format", "Puts sources into a uniform layout without changing their meaning");
     command->add_option("SOURCE", options->sources, "Source to format; - is standard input")->required();
     auto *in_place = command->add_flag("-i,--in-place", options->in_place,
                                        "Replace the sources; without it, formatted sources go to standard output");
@@ -93,11 +94,12 @@ void add_format(CLI::App &app, int &status) {
     auto *diffs = command->add_flag("--diff", options->diffs, "Only show what would change, as a diff");
     in_place->excludes(checks)->excludes(diffs);
     checks->excludes(diffs);
-    command->add_flag("--reorder", options->reorder, "Put attributes into their usual order, where it means nothing");
+    command->add_flag("--reorder", options->reorder,
+                      "Also put attributes into their usual order, where the order has no meaning");
     command->footer("Examples:\n"
-                    "  cdef format disk.cdefsrc | less     how it would look\n"
+                    "  cdef format disk.cdefsrc | less     show the result\n"
                     "  cdef format -i *.cdefsrc            format these sources\n"
-                    "  cdef format --check *.cdefsrc       for a build: list those that are not formatted\n"
+                    "  cdef format --check *.cdefsrc       in a build: list sources that are not formatted\n"
                     "\n" +
                     status_help("format"));
     command->callback([options, &status] { status = format_all(*options); });

@@ -231,17 +231,18 @@ int gate_run::run() {
 
 void add_gate(CLI::App &app, int &status) {
     auto options = std::make_shared<gate_options>();
-    CLI::App *command = app.add_subcommand("gate", "Finds what breaks those who rely on an older version of a class");
+    CLI::App *command =
+        app.add_subcommand("gate", "Reports what breaks programs or data that rely on an older version of a class");
     command
         ->add_option("SOURCE", options->operands,
                      "Source or database, or directory of sources (*.cdefsrc); - is standard input")
         ->required();
     command->add_option("--against", options->against,
                         "The older version: a file, a directory, or git:REVISION[:PATH]");
-    command->add_option("--level", options->level, "Who relies on it; each level includes those before")
+    command->add_option("--level", options->level, "What relies on it; each level includes those before")
         ->check(CLI::IsMember({"readers", "clients", "stored"}));
-    command->add_option("--ids", options->ids, "File of the numbers that were ever in use; ids.lock if left out");
-    command->add_flag("--update", options->update, "Record the numbers in that file, also those that it contradicts");
+    command->add_option("--ids", options->ids, "File of all numbers that have been in use; the default is ids.lock");
+    command->add_flag("--update", options->update, "Record the numbers in that file, even those that contradict it");
     add_report_options(*command, options->findings);
     add_project_rules(*command, options->findings);
     command->footer(status_help("gate"));

@@ -68,7 +68,7 @@ int write_first_source(const new_options &options) {
 
 void add_new(CLI::App &app, int &status) {
     auto options = std::make_shared<new_options>();
-    CLI::App *command = app.add_subcommand("new", "Writes a first source of a class");
+    CLI::App *command = app.add_subcommand("new", "Writes a source to start a new class from");
     command->add_option("KIND", options->kind, "What to write: class")->required()->check(CLI::IsMember({"class"}));
     command->add_option("NAME", options->name, "Name of the class")->required();
     command->add_option("-o,--output", options->file,

@@ -70,10 +70,11 @@ if(TARGET cdef)
   install(DIRECTORY schema DESTINATION "${CMAKE_INSTALL_DATADIR}/cdgen" COMPONENT program)
 endif()
 
-# For editors. Vim looks below its own prefix for the files of all users; Visual Studio Code has no such place.
+# For editors. Vim looks below its own prefix for the files of all users; the others have no such place.
 set(CDGEN_VIM_DIR "${CMAKE_INSTALL_DATADIR}/vim/vimfiles" CACHE STRING "Where Vim looks for the files of all users")
 install(DIRECTORY editors/vim/ DESTINATION "${CDGEN_VIM_DIR}" COMPONENT program)
-install(DIRECTORY editors/vscode DESTINATION "${CMAKE_INSTALL_DATADIR}/cdgen/editors" COMPONENT program)
+install(DIRECTORY editors/emacs editors/neovim editors/vscode DESTINATION "${CMAKE_INSTALL_DATADIR}/cdgen/editors"
+  COMPONENT program PATTERN node_modules EXCLUDE PATTERN "*.vsix" EXCLUDE)
 
 # For shells.
 set(CDGEN_ZSH_DIR "${CMAKE_INSTALL_DATADIR}/zsh/site-functions" CACHE STRING "Where zsh looks for completions")

@@ -8,7 +8,6 @@
 #include <array>
 #include <map>
 #include <optional>
-#include <set>
 #include <tuple>
 
 namespace source_index {
@@ -180,17 +179,6 @@ std::vector<mention> names::of(std::size_t name) const {
 
 names names_of(std::string_view source, const index &of) {
     return collector(source, of).collect();
-}
-
-std::vector<std::string> names_for(const names &known, name_kind kind, std::size_t scope) {
-    std::vector<std::string> found;
-    std::set<std::size_t> taken;
-    for (const mention &each : known.mentions) {
-        const named &name = known.all[each.name];
-        if (each.defines && name.kind == kind && name.scope == scope && taken.insert(each.name).second)
-            found.push_back(name.text);
-    }
-    return found;
 }
 
 } // namespace source_index

@@ -53,9 +53,6 @@ struct names {
 /* index: that of the source */
 names names_of(std::string_view source, const index &of);
 
-/* The names of one kind that may be meant in a stanza, in the order of the source. */
-std::vector<std::string> names_for(const names &known, name_kind kind, std::size_t scope);
-
 /* The kind of name that a stanza of this kind defines; none for one that defines no name. */
 const name_kind *defined_by(int stanza_kind);
 

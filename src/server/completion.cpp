@@ -8,6 +8,7 @@
 #include "server/documentation.h"
 #include "server/examples.h"
 #include "server/places.h"
+#include "text/hex.h"
 
 #include <algorithm>
 #include <set>
@@ -203,8 +204,13 @@ void add_values(items &to, const language::name_list &names, const table_attrs &
 }
 
 void add_names(items &to, const place_in_source &place, name_kind kind, std::size_t scope) {
-    for (const std::string &name : source_index::names_for(place.in.names(), kind, scope))
-        to.add(name, VARIABLE, name, {});
+    const source_index::names &names = place.in.names();
+    std::set<std::size_t> taken;
+    for (const source_index::mention &each : names.mentions) {
+        const source_index::named &name = names.all[each.name];
+        if (each.defines && name.kind == kind && name.scope == scope && taken.insert(each.name).second)
+            to.add(name.text, VARIABLE, name.text, name_documentation(place.in, each.name));
+    }
 }
 
 /* Properties that the list does not have yet. */
@@ -233,14 +239,15 @@ void add_expression_names(items &to, const place_in_source &place, const stretch
         return;
     }
     const source_index::mention *before = names.at(word.begin - 1);
-    for (const stanza &each : place.in.index().stanzas) {
-        bool owned = before != nullptr && each.is_element() && each.owner != source_index::NONE &&
-                     each.owner < place.in.index().stanzas.size();
+    for (const source_index::mention &each : names.mentions) {
+        const stanza &of = place.in.index().stanzas[each.stanza];
+        bool owned = before != nullptr && each.defines && of.is_element() && of.owner != source_index::NONE;
         if (!owned)
             continue;
-        std::string_view owner = place.in.index().stanzas[each.owner].value(place.text(), "Name");
+        std::string_view owner = place.in.index().stanzas[of.owner].value(place.text(), "Name");
         if (owner == names.all[before->name].text)
-            to.add(each.value(place.text(), "ElementName"), VARIABLE, each.value(place.text(), "ElementName"), {});
+            to.add(names.all[each.name].text, VARIABLE, names.all[each.name].text,
+                   name_documentation(place.in, each.name));
     }
 }
 
@@ -251,7 +258,7 @@ void add_valid_values(items &to, const place_in_source &place) {
         bool valid = each.known != nullptr && each.known->ta_type == AT_VALID_VALUE;
         std::string_view value = valid ? each.parts.value.of(place.text()) : std::string_view();
         if (!value.empty() && value.find(',') == value.npos && shown.insert(value).second)
-            to.add(value, VALUE, value, {});
+            to.add(value, VALUE, value, attribute_documentation(place.stanza->row(), *each.known));
     }
 }
 
@@ -275,12 +282,13 @@ void add_by_type(items &to, const place_in_source &place, const stretch &part) {
     case AT_ID:
     case AT_SD_INDEX: {
         std::string next = example_value(place.text(), place.in.index(), in, attr);
-        to.add(next, VALUE, next, {})["detail"] = "next free number";
+        to.add(next, VALUE, next, attribute_documentation(in.row(), attr))["detail"] = "next free number";
         return;
     }
     case AT_PERMISSION:
         for (const valid_perms_t &each : perm_list)
-            to.add({&each.permission, 1}, ENUM_MEMBER, {&each.permission, 1}, {});
+            to.add({&each.permission, 1}, ENUM_MEMBER, {&each.permission, 1},
+                   "mask " + text::hex(each.mask) + "\n\n" + attribute_documentation(in.row(), attr));
         return;
     case AT_DEFAULT_VALUE:
     case AT_INITIAL_VALUE:

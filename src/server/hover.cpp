@@ -76,20 +76,7 @@ stretch item_at(std::string_view source, const stretch &list, std::size_t offset
 
 std::string name_text(const place_in_source &place) {
     const source_index::mention *mention = place.in.names().at(place.offset);
-    if (mention == nullptr)
-        return {};
-    std::string text;
-    for (const source_index::mention &each : place.in.names().of(mention->name)) {
-        const source_index::stanza &of = place.in.index().stanzas[each.stanza];
-        if (!each.defines)
-            continue;
-        text = language::quoted(place.in.names().all[each.name].text) + ": " + language::quoted(of.row().sc_name);
-        for (const char *line : {"Id", "ElementIndex", "DataType"})
-            if (std::string_view value = of.value(place.text(), line); !value.empty())
-                text.append(", ").append(line).append(" ").append(value);
-        break;
-    }
-    return text;
+    return mention == nullptr ? std::string() : name_documentation(place.in, mention->name);
 }
 
 /* The place for the text of a message number, from the class's catalog. */

@@ -2,6 +2,10 @@
 
 #include "server/places.h"
 
+#include "language/suggestions.h"
+
+#include <algorithm>
+
 namespace lsp {
 
 place_in_source place_at(document &in, std::size_t offset) {
@@ -28,6 +32,19 @@ place_in_source place_at(document &in, std::size_t offset) {
 place_in_source place_in(session &now, const json &params) {
     document &in = now.document_in(params);
     return place_at(in, in.offset_of(position_from(member(params, "position")), now.client.units));
+}
+
+std::string name_documentation(document &in, std::size_t name) {
+    std::vector<source_index::mention> all = in.names().of(name);
+    auto definition = std::find_if(all.begin(), all.end(), [](const auto &each) { return each.defines; });
+    if (definition == all.end())
+        return {};
+    const source_index::stanza &of = in.index().stanzas[definition->stanza];
+    std::string text = language::quoted(in.names().all[name].text) + ": " + language::quoted(of.row().sc_name);
+    for (const char *line : {"Id", "ElementIndex", "DataType"})
+        if (std::string_view value = of.value(in.text(), line); !value.empty())
+            text.append(", ").append(line).append(" ").append(value);
+    return text;
 }
 
 json location_of(const session &now, document &in, const stretch &part) {

@@ -28,6 +28,9 @@ place_in_source place_at(document &in, std::size_t offset);
 /* The place that the parameters of a request name: a document and a position. */
 place_in_source place_in(session &now, const json &params);
 
+/* What defines a name of the document, as Markdown; empty if nothing does. */
+std::string name_documentation(document &in, std::size_t name);
+
 /* A location, or a list of several. */
 json location_of(const session &now, document &in, const stretch &part);
 

@@ -285,6 +285,7 @@ def test_values(pump, line, expected):
     until = PUMP.index("ClassToManagerMapping")
     items, _ = complete(pump, PUMP[:until] + "DynamicResourceAttribute\n" + line + "\n" + PUMP[until:])
     assert labels(items) == expected
+    assert all(each["documentation"]["value"] for each in items)
 
 
 def test_types_are_those_of_the_stanza(pump):

@@ -1,0 +1,76 @@
+/* The language server without a process. */
+
+#include "server/server.h"
+
+#include "check/found_in.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using lsp::json;
+
+/* All that a server says to these messages. */
+std::vector<json> said(lsp::server &to, const std::vector<json> &messages) {
+    for (const json &each : messages)
+        to.receive({lsp::frame_state::whole, each.dump()});
+    std::vector<json> all;
+    while (to.has_work())
+        to.work();
+    for (const std::string &body : to.take_output())
+        all.push_back(json::parse(body));
+    return all;
+}
+
+json request(int id, const char *method, json params) {
+    return {{"jsonrpc", "2.0"}, {"id", id}, {"method", method}, {"params", std::move(params)}};
+}
+
+const json INITIALIZE = request(1, "initialize", {{"capabilities", json::object()}});
+
+lsp::surroundings nothing() {
+    lsp::surroundings world;
+    world.read = [](const std::string &) { return std::nullopt; };
+    world.sources_in = [](const std::string &) { return std::vector<std::string>(); };
+    world.project_file = "";
+    return world;
+}
+
+TEST(Server, ShowsTheTextOfAMessageIfItIsKnown) {
+    lsp::surroundings world = nothing();
+    world.message_text = [](const lsp::message_number &wanted) -> std::optional<std::string> {
+        return wanted.catalog + "/" + wanted.set + "/" + wanted.number;
+    };
+    lsp::server server(world);
+    json about = {{"uri", "file:///a.cdefsrc"}, {"version", 1}, {"text", found_in::CLASS}};
+    json place = {{"textDocument", {{"uri", "file:///a.cdefsrc"}}}, {"position", {{"line", 3}, {"character", 4}}}};
+    std::vector<json> answers =
+        said(server, {INITIALIZE,
+                      {{"method", "textDocument/didOpen"}, {"params", {{"textDocument", about}}}},
+                      request(2, "textDocument/hover", place)});
+    std::string text = answers.at(1).at("result").at("contents").at("value");
+    EXPECT_TRUE(text.ends_with("\n- text: m/1/1")) << text;
+}
+
+TEST(Server, AnswersInOrderAndForgetsCancelledRequests) {
+    lsp::server server(nothing());
+    json cancel = {{"method", "$/cancelRequest"}, {"params", {{"id", 3}}}};
+    std::vector<json> answers =
+        said(server, {INITIALIZE, request(2, "workspace/symbol", {{"query", ""}}),
+                      request(3, "workspace/symbol", {{"query", ""}}), cancel, request(4, "shutdown", nullptr)});
+    ASSERT_EQ(answers.size(), 4U);
+    EXPECT_EQ(answers[1].at("result"), json::array());
+    EXPECT_EQ(answers[2].at("error").at("code"), -32800);
+    EXPECT_EQ(answers[3].at("id"), 4);
+}
+
+TEST(Server, WaitsForNoMoreThanItCanHold) {
+    lsp::server server(nothing());
+    for (int i = 0; i < 256; ++i) {
+        EXPECT_FALSE(server.is_full());
+        server.receive({lsp::frame_state::whole, INITIALIZE.dump()});
+    }
+    EXPECT_TRUE(server.is_full());
+}
+
+} // namespace

@@ -281,6 +281,8 @@ void swap_var_class(const swap_section &section) {
     if (!section.holds(0, sizeof(rsrc_variable_class_t)))
         return;
     auto rvc = load<rsrc_variable_class_t>(section.start);
+    if (!section.holds(sizeof rvc, rvc.u_rvc_string_tbl.offset[0]))
+        return swap_fields<cdb::variable_class_fields>(section.start);
     size_t ids = sizeof rvc + rvc.u_rvc_string_tbl.offset[0];
     for (vx_uint32_t n = section.records_inside(ids, rvc.rvc_var_count, sizeof(var_id_t)); n > 0; --n)
         swap_word(section.start + ids + (n - 1) * sizeof(var_id_t));

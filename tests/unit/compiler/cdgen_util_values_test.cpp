@@ -231,7 +231,7 @@ TEST(OverflowMark, RefusesZerosFromThenOn) {
 
 TEST(OverflowMark, IsAlsoLeftByPlainNumbersAndVersions) {
     cdgen plain, version;
-    EXPECT_EQ(int_from_text(plain, "99999999999999999999", nullptr, 0), LONG_MAX);
+    EXPECT_EQ(int_from_text(plain, "99999999999999999999", nullptr, 0), LLONG_MAX);
     EXPECT_EQ(plain.conv_errno, ERANGE);
     vx_uint32_t n = 0;
     EXPECT_EQ(ver_str_convert(version, "99999999999999999999.1", &n), 0);

@@ -36,8 +36,6 @@ struct gate_options {
     finding_options findings;
 };
 
-constexpr const char *UNNAMED = "class"; /* a class without a name, if nothing else is known of it */
-
 compare::level level_called(std::string_view name) {
     return *std::find_if(std::begin(compare::levels), std::end(compare::levels),
                          [name](compare::level each) { return compare::name_of(each) == name; });
@@ -66,20 +64,30 @@ std::string_view text_of(const std::vector<std::byte> &bytes) {
     return {reinterpret_cast<const char *>(bytes.data()), bytes.size()};
 }
 
-/* The name of the only class; a class without a name is called after its file, which may have moved since. */
-std::string class_name_of(const version *before) {
+/* "Disk" for "old/Disk.le.cdef". */
+std::string stem_of(const std::string &path) {
+    std::string name = path.substr(path.rfind('/') + 1);
+    return name.substr(0, name.find(".cdef"));
+}
+
+/* The name of a class without one. It is called after its database, whose directory is not known here; so it has the
+ * older version's name if that is called after its own file. */
+std::string class_name_for(const std::string &path, const version *before) {
+    std::string own = stem_of(path);
+    if (before == nullptr)
+        return own;
     std::string name;
-    if (before != nullptr)
-        for (const auto &each : before->in.db.classes())
-            name = each.name();
-    return name.empty() ? UNNAMED : name;
+    for (const auto &each : before->in.db.classes())
+        name = each.name();
+    std::string older = stem_of(name);
+    return older == own || older == stem_of(before->in.name) ? name : own;
 }
 
 /* The older version as a database. A source is compiled; it may not have errors. */
 std::unique_ptr<version> readable(older_version &&old) {
     if (!is_text(old.bytes))
         return std::make_unique<version>(old.name, std::move(old.bytes));
-    gate::compiled made = gate::compile(text_of(old.bytes), old.name, UNNAMED);
+    gate::compiled made = gate::compile(text_of(old.bytes), old.name, stem_of(old.name));
     if (!made.findings.empty())
         throw failure(old.name + ": not a source that compiles; 'cdef check' says why");
     return std::make_unique<version>(old.name, std::move(made.image));
@@ -182,7 +190,7 @@ check::totals gate_run::judge(const operand &what, report::writer &form) {
     std::vector<std::byte> image = bytes_of(source);
     std::vector<check::finding> found;
     if (is_text(image) || image.empty()) {
-        gate::compiled made = gate::compile(source, what.path, class_name_of(before.get()));
+        gate::compiled made = gate::compile(source, what.path, class_name_for(what.path, before.get()));
         image = std::move(made.image);
         found = std::move(made.findings);
     } else {

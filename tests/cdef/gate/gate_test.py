@@ -143,6 +143,8 @@ def test_names_a_nameless_class_after_the_older_one(world):
     world.path("old").mkdir()
     expect(world.inspect("build", "-q", "-o", "old/place.cdef", "new.cdefsrc"), 0)
     expect(world.inspect("gate", "--against=old/place.cdef", "new.cdefsrc"), 0)
+    write(world, "old.cdefsrc", HEAD)
+    check(codes(found(world, "--against=old.cdefsrc", "new.cdefsrc")[1]) == {"CMP101"}, "a name that is gone")
 
 
 # ---- Older versions --------------------------------------------------------------------------------------------------

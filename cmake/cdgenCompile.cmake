@@ -1,4 +1,4 @@
-# cdgen_compile(TARGET SOURCE OUTPUT [BYTE_ORDER native|little|big|both] [NO_TIMESTAMP] [WERROR])
+# cdgen_compile(TARGET SOURCE OUTPUT [BYTE_ORDER native|little|big|both] [NO_TIMESTAMP] [WERROR] [GATE BASELINE])
 #
 # Builds the database OUTPUT of the class definition SOURCE with "cdef build", which shows every error and warning, and
 # replaces the database in one step. Relative paths count from the current source and the current binary directory.
@@ -9,11 +9,32 @@
 #                 OUTPUT NAME.cdef stands for NAME.le.cdef and NAME.be.cdef
 #   NO_TIMESTAMP  the database has no time of building: equal sources then make equal files
 #   WERROR        a source with warnings makes no database
+#   GATE          a source that breaks those who rely on an older version makes no database either. BASELINE is that
+#                 version as "cdef gate" takes it: a file, a directory, or git:REVISION[:PATH]; relative paths count from
+#                 the current source directory. cdef.toml chooses the level, and the file of numbers
 #
-# The database is built again when the source or cdef has changed. If the source has errors, the old database stays.
+# The database is built again when the source, its cdef.toml, the older version or cdef has changed. If the source has
+# errors, the old database stays.
+
+# The project file that cdef finds for a source; empty if there is none.
+function(cdgen_project_file SOURCE variable)
+  set(found "")
+  cmake_path(GET SOURCE PARENT_PATH at)
+  while(NOT found)
+    if(EXISTS "${at}/cdef.toml" AND NOT IS_DIRECTORY "${at}/cdef.toml")
+      set(found "${at}/cdef.toml")
+    endif()
+    cmake_path(GET at PARENT_PATH above)
+    if(above STREQUAL at)
+      break()
+    endif()
+    set(at "${above}")
+  endwhile()
+  set("${variable}" "${found}" PARENT_SCOPE)
+endfunction()
 
 function(cdgen_compile TARGET SOURCE OUTPUT)
-  cmake_parse_arguments(PARSE_ARGV 3 arg "NO_TIMESTAMP;WERROR" "BYTE_ORDER" "")
+  cmake_parse_arguments(PARSE_ARGV 3 arg "NO_TIMESTAMP;WERROR" "BYTE_ORDER;GATE" "")
   if(DEFINED arg_UNPARSED_ARGUMENTS OR DEFINED arg_KEYWORDS_MISSING_VALUES)
     message(FATAL_ERROR "cdgen_compile: cannot read \"${arg_UNPARSED_ARGUMENTS}${arg_KEYWORDS_MISSING_VALUES}\"")
   endif()
@@ -45,6 +66,21 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
     list(APPEND options --werror)
   endif()
 
+  cdgen_project_file("${SOURCE}" depends)
+  set(gate "")
+  if(DEFINED arg_GATE)
+    if(NOT arg_GATE MATCHES "^git:")
+      cmake_path(ABSOLUTE_PATH arg_GATE BASE_DIRECTORY "${CMAKE_CURRENT_SOURCE_DIR}" NORMALIZE)
+      list(APPEND depends "${arg_GATE}")
+    endif()
+    set(strict "")
+    if(arg_WERROR)
+      set(strict --werror)
+    endif()
+    set(gate COMMAND "${CMAKE_COMMAND}" -E chdir "${place}" "$<TARGET_FILE:cdgen::cdef>" gate "--against=${arg_GATE}"
+      ${strict} -- "${SOURCE}")
+  endif()
+
   # The hash distinguishes names that are equal without characters that a target's name cannot have (a-b, a_b).
   string(MD5 hash "${shown}")
   string(SUBSTRING "${hash}" 0 8 hash)
@@ -61,9 +97,10 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
   # A class without a Name is named after the output as given on the command line, which is the bare file name.
   add_custom_command(OUTPUT ${databases}
     COMMAND "${CMAKE_COMMAND}" -E make_directory "${place}"
+    ${gate}
     COMMAND "${CMAKE_COMMAND}" -E chdir "${place}" "$<TARGET_FILE:cdgen::cdef>" build ${options} -- "${SOURCE}"
     ${restat}
-    DEPENDS "${SOURCE}" "$<TARGET_FILE:cdgen::cdef>"
+    DEPENDS "${SOURCE}" ${depends} "$<TARGET_FILE:cdgen::cdef>"
     COMMENT "Building class definition ${shown}"
     VERBATIM)
 

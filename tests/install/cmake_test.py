@@ -109,6 +109,35 @@ class Compile:
         self.assertRaises(AssertionError, self.build)
         self.assertFalse((self.here / "b/strict.cdef").exists())
 
+    def test_gate_keeps_the_old_database(self):
+        old, new = disk().read_bytes(), disk().read_bytes().replace(b"Id=1\n", b"Id=77\n")
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef GATE released)\ncdgen_compile(b b.cdefsrc b.cdef GATE released)",
+                     a=old, b=old.replace(b"Name=Disk", b"Name=Other").replace(b"disk.cat", b"b.cat"))
+        (self.here / "released").mkdir()
+        (self.here / "released/a.cdefsrc").write_bytes(old)
+        self.build()
+        before = self.made("a.cdef")
+        (self.here / "a.cdefsrc").write_bytes(new)
+        later(self.here / "a.cdefsrc")
+        with self.assertRaises(AssertionError) as failed:
+            self.build()
+        self.assertRegex(str(failed.exception), r"a\.cdefsrc:\d+:\d+: error: .*Id 1 -> 77 .*\[CMP102\]")
+        self.assertEqual(self.made("a.cdef"), before)
+        (self.here / "released/a.cdefsrc").write_bytes(new)
+        self.build()
+        self.assertNotEqual(self.made("a.cdef"), before)
+
+    def test_project_file_builds_again(self):
+        (self.here / "cdef.toml").write_text("")
+        odd = disk().read_bytes().replace(b"Id=1\n", b"Id=010\n")
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=odd)
+        self.assertIn("S509", self.build())
+        (self.here / "cdef.toml").write_text("[warnings]\nwerror = true\n")
+        later(self.here / "cdef.toml")
+        with self.assertRaises(AssertionError) as failed:
+            self.build()
+        self.assertIn("S509", str(failed.exception))
+
     def test_what_a_killed_build_left_behind_is_cleared(self):
         self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=disk().read_bytes())
         (self.here / "b/.a.cdef.cdef-new").write_bytes(b"half")

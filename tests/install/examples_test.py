@@ -25,6 +25,7 @@ class Project(Case):
         run("make", cwd=self.project, env=pkg_config_environment())
         self.assertEqual(run("./show", "Disk.cdef", cwd=self.project), SHOWN)
         self.no_half_of_a_database()
+        run("make", "gate", "BASELINE=Disk.cdefsrc", cwd=self.project, env=pkg_config_environment())
         self.every_mistake_is_shown(lambda: run("make", cwd=self.project, env=pkg_config_environment()),
                                     self.project / "Disk.cdefsrc")
         self.no_package()
@@ -56,9 +57,10 @@ class Project(Case):
 
     def test_meson(self):
         environment = pkg_config_environment()
-        run("meson", "setup", "build", cwd=self.project, env=environment)
+        run("meson", "setup", "build", f"-Dbaseline={self.project}/Disk.cdefsrc", cwd=self.project, env=environment)
         run("ninja", "-C", "build", cwd=self.project, env=environment)
         self.assertEqual(run("build/show", "build/Disk.cdef", cwd=self.project), SHOWN)
+        run("meson", "test", "-C", "build", cwd=self.project, env=environment)
         self.every_mistake_is_shown(lambda: run("ninja", "-C", "build", cwd=self.project, env=environment),
                                     self.project / "Disk.cdefsrc")
 

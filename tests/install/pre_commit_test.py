@@ -1,0 +1,73 @@
+"""The hooks for pre-commit, with Debian's pre-commit and the installed programs."""
+
+import os
+import subprocess
+import unittest
+
+from installed import Case, PROJECT, examples, run, tree
+
+
+class Hooks(Case):
+    def setUp(self):
+        super().setUp()
+        self.hooks, self.project = self.here / "hooks", self.here / "project"
+        who = {f"GIT_{role}_{what}": "someone@example.com" for role in ("AUTHOR", "COMMITTER") for what in ("NAME", "EMAIL")}
+        self.environment = {**os.environ, **who, "PATH": f"{tree() / 'bin'}:{os.environ['PATH']}",
+                            "PRE_COMMIT_HOME": str(self.here / "home"), "GIT_CONFIG_GLOBAL": "/dev/null"}
+        for place in (self.hooks, self.project):
+            place.mkdir()
+            self.git(place, "init", "-q", ".")
+        (self.hooks / ".pre-commit-hooks.yaml").write_bytes((PROJECT / ".pre-commit-hooks.yaml").read_bytes())
+        self.commit(self.hooks)
+        revision = self.git(self.hooks, "rev-parse", "HEAD").strip()
+        (self.project / ".pre-commit-config.yaml").write_text(
+            f"repos:\n  - repo: '{self.hooks}'\n    rev: {revision}\n    hooks:\n"
+            "      - id: cdef-check\n      - id: cdef-gate\n")
+        self.source = self.project / "a b.cdefsrc"
+        self.source.write_bytes((examples() / "projects/make/Disk.cdefsrc").read_bytes())
+        self.commit(self.project)
+
+    def git(self, place, *arguments):
+        return run("git", *arguments, cwd=place, env=self.environment)
+
+    def commit(self, place):
+        self.git(place, "add", "-A")
+        self.git(place, "commit", "-qm", "a commit")
+
+    def run_hooks(self):
+        """The status, and what the hooks say of a staged change."""
+        self.git(self.project, "add", "-A")
+        done = subprocess.run(["pre-commit", "run", "--color=never"], cwd=self.project, env=self.environment, text=True,
+                              stdout=subprocess.PIPE, stderr=subprocess.STDOUT, check=False)
+        return done.returncode, done.stdout
+
+    def change(self, old, new):
+        text = self.source.read_bytes()
+        self.assertIn(old, text)
+        self.source.write_bytes(text.replace(old, new, 1))
+
+    def test_pass_what_is_sound(self):
+        self.change(b"BlockSize", b"BlockSize")
+        (self.project / "other.txt").write_text("nothing of theirs")
+        status, said = self.run_hooks()
+        self.assertEqual(status, 0, said)
+        self.source.write_bytes(self.source.read_bytes() + b"# a comment\n")
+        status, said = self.run_hooks()
+        self.assertEqual(status, 0, said)
+        self.assertEqual(said.count("Passed"), 2, said)
+
+    def test_stop_mistakes(self):
+        self.change(b"UInt32", b"Uint32")
+        status, said = self.run_hooks()
+        self.assertEqual(status, 1, said)
+        self.assertIn("a b.cdefsrc:18:11: error: Invalid data type", said)
+
+    def test_stop_what_breaks_others(self):
+        self.change(b"Id=1\n", b"Id=77\n")
+        status, said = self.run_hooks()
+        self.assertEqual(status, 1, said)
+        self.assertIn("Id 1 -> 77 (readers know it by its number) [CMP102]", said)
+
+
+if __name__ == "__main__":
+    unittest.main()

@@ -30,7 +30,7 @@ std::optional<std::uint32_t> constant_in(const cdb::field_fact &fact) {
 }
 
 /* Checks that every field that no line fills has the value that the compiler gives it. */
-template <class Record> void require_plain(const Record &record, const std::string &place) {
+template <class Record> void require_plain(const Record &record, const record_name &place) {
     const auto *bytes = reinterpret_cast<const std::byte *>(&record);
     for (const cdb::field &f : cdb::fields_of<Record>) {
         if (f.kind != cdb::field_kind::number && f.kind != cdb::field_kind::reference)
@@ -42,14 +42,14 @@ template <class Record> void require_plain(const Record &record, const std::stri
     }
 }
 
-void require_plain_definition(const cdb::sd_definition &definition, const std::string &place) {
+void require_plain_definition(const cdb::sd_definition &definition, const record_name &place) {
     for (const cdb::sd_element &e : definition)
-        require_plain(e.record(), place + ", element " + text::quoted_ascii(e.name()));
+        require_plain(e.record(), place.with_element(e.name()));
 }
 
 template <class List> void require_plain_attributes(const List &list, table from) {
     for (const auto &attr : list) {
-        std::string place = place_of(side_table_of(from).stanza, attr.name());
+        record_name place = place_of(side_table_of(from).stanza, attr.name());
         require_plain(attr.record(), place);
         require_plain_definition(attr.structure(), place);
     }
@@ -57,7 +57,7 @@ template <class List> void require_plain_attributes(const List &list, table from
 
 void require_plain_actions(const cdb::resource_class &c, table from) {
     for (const cdb::action &action : c.actions(level_of(from))) {
-        std::string place = place_of(side_table_of(from).stanza, action.name());
+        record_name place = place_of(side_table_of(from).stanza, action.name());
         require_plain(action.record(), place);
         require_plain_definition(action.input(), place);
         require_plain_definition(action.response(), place);
@@ -66,7 +66,7 @@ void require_plain_actions(const cdb::resource_class &c, table from) {
 
 void require_plain_class(const cdb::resource_class &c) {
     using enum cdb::level;
-    std::string place = place_of("ResourceClass", c.name());
+    record_name place = place_of("ResourceClass", c.name());
     require_plain(c.record(), place);
     for (const class_input &input : class_inputs)
         require_plain_definition(c.sd_input(input.reference), place);
@@ -106,14 +106,14 @@ void require_sections(const cdb::database &db) {
 } // namespace
 
 void require_settable(const cdb::database &db) {
-    require_plain(db.header(), "database");
+    require_plain(db.header(), {"database"});
     require_sections(db);
     for (const cdb::resource_class &c : db.classes())
         require_plain_class(c);
     for (const cdb::manager &m : db.managers())
         require_plain(m.record(), place_of("ResourceManager", m.name()));
     for (const cdb::class_map &m : db.maps())
-        require_plain(m.record(), "ClassToManagerMapping");
+        require_plain(m.record(), {"ClassToManagerMapping"});
     for (const cdb::variable_class &v : db.variable_classes())
         require_plain(v.record(), place_of("ResourceVariableClass", v.name()));
 }

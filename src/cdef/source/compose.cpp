@@ -33,7 +33,8 @@ constexpr std::string_view HEADING =
 /* ---- The class ------------------------------------------------------------------------------------------------- */
 
 bool can_be_given(std::string_view name, std::string_view value) {
-    return attribute_line(name, value).has_value();
+    std::string line;
+    return append_attribute_line(line, name, value);
 }
 
 /* The compiler takes the first persistent attribute of the name that a Locator gives, and the low half of its Id. */
@@ -161,7 +162,7 @@ void plan_locator(std::vector<class_plan> &plans) {
 }
 
 void write_control_definition(source_writer &out, const cdb::resource_class &c) {
-    std::string place = place_of("ResourceClass", c.name());
+    record_name place = place_of("ResourceClass", c.name());
     plain_stanza_writer{out, {.record = bytes_of(c.record()), .strings = c.side_tables().strings, .place = place}}
         .write(SC_CONTROL_DEFINITION);
 }
@@ -183,7 +184,7 @@ public:
     map_writer(source_writer &to, const cdb::database &database, const cdb::class_map &map)
         : out(to), from({.record = bytes_of(map.record()),
                          .strings = map.strings(),
-                         .place = "ClassToManagerMapping",
+                         .place = {"ClassToManagerMapping"},
                          .may_lack_texts = true}),
           db(database) {}
 

@@ -47,7 +47,7 @@ std::uint32_t number_without_line(cdb::meaning as, bool is_completed) {
     }
 }
 
-std::string permission_text(std::uint32_t mask, const std::string &place) {
+std::string permission_text(std::uint32_t mask, const record_name &place) {
     if (mask == 0)
         return std::string(NO_PERMISSION);
     char letter = permission_letter(mask);
@@ -56,7 +56,7 @@ std::string permission_text(std::uint32_t mask, const std::string &place) {
     return {letter};
 }
 
-std::string number_text(std::uint32_t number, cdb::meaning as, const std::string &place) {
+std::string number_text(std::uint32_t number, cdb::meaning as, const record_name &place) {
     switch (as) {
     case SIGNED:
         return std::to_string(static_cast<std::int32_t>(number));
@@ -169,7 +169,7 @@ std::optional<std::string> plain_text(const stanza_line &line, const stanza_reco
     return number_text(number_in(line, from), line.fact->as, from.place);
 }
 
-std::string properties_text(std::uint32_t bits, std::span<const props_t> known, const std::string &place) {
+std::string properties_text(std::uint32_t bits, std::span<const props_t> known, const record_name &place) {
     std::string names;
     std::uint32_t unknown =
         take_properties(bits, known, [&](const char *name) { names.append(names.empty() ? "" : ",").append(name); });

@@ -38,7 +38,7 @@ bool is_plain(const stanza_line &line);
 struct stanza_record {
     cdb::bytes record; /* in the byte order of this machine */
     cdb::bytes strings;
-    std::string place;                  /* for messages */
+    record_name place;                  /* for messages */
     bool is_completed = true;           /* the compiler gave defaults to fields that no line fills */
     bool may_lack_texts = false;        /* a required text may be missing */
     std::string no_optional_lines = {}; /* why no optional line can follow; empty: they can */
@@ -56,7 +56,7 @@ bool is_default(const stanza_line &line, const stanza_record &from);
 std::optional<std::string> plain_text(const stanza_line &line, const stanza_record &from);
 
 /* The names of the bits, as they are written in a Properties line. Throws no_source_error for a bit without a name. */
-std::string properties_text(std::uint32_t bits, std::span<const props_t> known, const std::string &place);
+std::string properties_text(std::uint32_t bits, std::span<const props_t> known, const record_name &place);
 
 /* A field for whose lines there is a special function. */
 template <class Writer> struct own_line {

@@ -29,7 +29,7 @@ constexpr run_names runs_of(table t) {
 }
 
 /* The compiler adds InvalForDefine to a completed persistent attribute without another such property. */
-std::uint32_t given_properties(std::uint32_t bits, bool cut_short, const std::string &place) {
+std::uint32_t given_properties(std::uint32_t bits, bool cut_short, const record_name &place) {
     if (cut_short || (bits & (REQD_FOR_DEFINE | OPT_FOR_DEFINE)) != 0)
         return bits;
     if ((bits & INVAL_FOR_DEFINE) == 0)

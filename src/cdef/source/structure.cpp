@@ -23,7 +23,7 @@ bool same_types(const std::vector<vx_data_type_t> &types, const cdb::sd_definiti
 
 /* Structured data cannot contain structured data. Elements that become part of a value must have a type with a default.
  */
-void require_types(const cdb::sd_definition &definition, bool makes_value, const std::string &place) {
+void require_types(const cdb::sd_definition &definition, bool makes_value, const record_name &place) {
     for (const cdb::sd_element &e : definition) {
         if (cdb::element_type(e.type()) == VX_SD_PTR || (makes_value && !has_default(e.type())))
             no_source(place, "it has an element of type " + std::string(cdb::name_of(e.type())));
@@ -40,8 +40,8 @@ public:
           type(record.sd_field_type), values(valid_values), element_index(index) {}
 
     /* place: of the run. */
-    void write(std::string_view stanza, const std::string &place) {
-        from.place = place + ", element " + text::quoted_ascii(element_name);
+    void write(std::string_view stanza, const record_name &place) {
+        from.place = place.with_element(element_name);
         out.stanza(stanza, from.place);
         write_lines(*this, lines_of(SC_PATTR_SD_DEFINITION)); /* all kinds of elements have the same lines */
     }
@@ -80,7 +80,7 @@ private:
 };
 
 void write_indexed_run(source_writer &out, std::string_view stanza, const cdb::sd_definition &definition,
-                       const std::vector<bool> &indexed, const std::string &place) {
+                       const std::vector<bool> &indexed, const record_name &place) {
     std::size_t index = 0;
     for (std::size_t i = 0; i < definition.size(); ++i) {
         cdb::sd_element e = definition[i];
@@ -94,7 +94,7 @@ void write_indexed_run(source_writer &out, std::string_view stanza, const cdb::s
 
 /* A run that the next one replaced; only its value is left in the database. */
 void write_replaced_run(source_writer &out, const attribute_structure &s, const element_types &value, std::size_t given,
-                        const std::string &place) {
+                        const record_name &place) {
     out.comment("The next run replaces this one, but for the value.");
     for (std::size_t i = 0; i < value.types.size(); ++i) {
         sd_field_t element = {};
@@ -104,7 +104,7 @@ void write_replaced_run(source_writer &out, const attribute_structure &s, const 
     }
 }
 
-std::size_t require_indices(std::size_t elements, std::uint16_t highest, const std::string &place) {
+std::size_t require_indices(std::size_t elements, std::uint16_t highest, const record_name &place) {
     std::optional<std::size_t> given = indices_given(elements, highest);
     if (!given)
         no_source(place, "it has fewer elements than its highest ElementIndex says");
@@ -113,7 +113,7 @@ std::size_t require_indices(std::size_t elements, std::uint16_t highest, const s
 
 /* The value comes from the definition's run, or from a run of the same length that it replaced. */
 void write_own_run(source_writer &out, const attribute_structure &s, const element_types &value,
-                   const std::string &place) {
+                   const record_name &place) {
     if (!same_types(value.types, s.definition))
         write_replaced_run(out, s, value, value.types.size(), place);
     std::size_t given = require_indices(s.definition.size(), s.highest_index, place);
@@ -122,7 +122,7 @@ void write_own_run(source_writer &out, const attribute_structure &s, const eleme
 
 /* The value, if there is one, and the highest index come from an earlier run. */
 void write_late_run(source_writer &out, const attribute_structure &s, const element_types &value,
-                    const std::string &place) {
+                    const record_name &place) {
     if (value.found)
         write_replaced_run(out, s, value, require_indices(value.types.size(), s.highest_index, place), place);
     else if (s.highest_index != NO_SD_INDEX)
@@ -138,12 +138,12 @@ std::vector<std::size_t> own_element_fields() {
 }
 
 void write_run(source_writer &out, std::string_view stanza, const cdb::sd_definition &definition,
-               const std::string &place) {
+               const record_name &place) {
     require_types(definition, false, place);
     write_indexed_run(out, stanza, definition, std::vector<bool>(definition.size(), true), place);
 }
 
-void write_structure(source_writer &out, const attribute_structure &s, const std::string &place) {
+void write_structure(source_writer &out, const attribute_structure &s, const record_name &place) {
     require_types(s.definition, true, place);
     element_types value = types_of(s.value);
     if (!value.defaults)

@@ -18,11 +18,11 @@ struct attribute_structure {
 };
 
 /* place: for messages. Throws no_source_error for what no run can give. */
-void write_structure(source_writer &out, const attribute_structure &s, const std::string &place);
+void write_structure(source_writer &out, const attribute_structure &s, const record_name &place);
 
 /* A run for an action or the class. */
 void write_run(source_writer &out, std::string_view stanza, const cdb::sd_definition &definition,
-               const std::string &place);
+               const record_name &place);
 
 /* Offsets of the fields for whose lines an element's stanza has special functions. */
 std::vector<std::size_t> own_element_fields();

@@ -15,9 +15,16 @@ namespace {
 
 constexpr std::string_view BLANKS = " \t";
 
+/* True of a character that is text wherever it is in a line, except that blanks at the end are removed. */
+bool is_never_special(char c) {
+    return c != '\n' && c != '\0' && c != '"' && c != '#' && c != '/';
+}
+
 /* True if the compiler reads the whole line as text: it has no newline, no comment, and nothing at the end that the
  * compiler removes. */
 bool is_all_text(std::string_view line) {
+    if (std::all_of(line.begin(), line.end(), is_never_special))
+        return !line.ends_with(' ') && !line.ends_with('\t');
     bool quoted = false;
     for (std::size_t i = 0; i < line.size(); ++i) {
         char next = i + 1 < line.size() ? line[i + 1] : '\0';
@@ -114,15 +121,23 @@ bool is_empty_handle(const cdb::value &v) {
 
 } // namespace
 
-std::optional<std::string> attribute_line(std::string_view name, std::string_view value) {
-    std::string start = "\t" + std::string(name) + "=";
-    std::string plain = start + std::string(value);
-    if (!value.empty() && !begins_with_quote(value) && fits(plain))
-        return plain;
-    std::string quoted = start + '"' + std::string(value) + '"';
-    if (!value.empty() && !value.ends_with('\\') && fits(quoted))
-        return quoted;
-    return std::nullopt;
+bool append_attribute_line(std::string &to, std::string_view name, std::string_view value) {
+    if (value.empty())
+        return false;
+    std::size_t start = to.size();
+    to.append("\t").append(name).append("=").append(value);
+    auto line = [&] { return std::string_view(to).substr(start); };
+    bool is_written = !begins_with_quote(value) && fits(line());
+    if (!is_written) {
+        to.resize(to.size() - value.size());
+        to.append("\"").append(value).append("\"");
+        is_written = !value.ends_with('\\') && fits(line());
+    }
+    if (!is_written)
+        to.resize(start);
+    else
+        to += '\n';
+    return is_written;
 }
 
 std::vector<std::string> texts_of(const cdb::value &value, bool in_pair) {

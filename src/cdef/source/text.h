@@ -4,15 +4,15 @@
 
 #include "cdb_view.h"
 
-#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
 
 namespace cdef::source {
 
-/* The line that gives an attribute a value, without its newline; no value if no line can. */
-std::optional<std::string> attribute_line(std::string_view name, std::string_view value);
+/* Appends the line that gives an attribute a value, with its newline. False, and nothing is appended, if no line does.
+ */
+bool append_attribute_line(std::string &to, std::string_view name, std::string_view value);
 
 /* The texts of a value that are worth trying, the best one first; none if it has no text. They all stand for the same
  * value, but one may fit into a line where another does not. in_pair: the text must not contain a comma. */

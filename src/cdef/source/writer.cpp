@@ -20,13 +20,14 @@ void source_writer::blank_line() {
     text += "\n";
 }
 
-void source_writer::stanza(std::string_view kind, std::string place) {
-    text += std::string(kind) + "\n";
-    current = std::move(place);
+void source_writer::stanza(std::string_view kind, const record_name &place) {
+    text.append(kind) += '\n';
+    current = place;
 }
 
 void source_writer::line(std::string_view name, std::string_view value) {
-    line_of_any(name, std::vector{std::string(value)});
+    if (!append_attribute_line(text, name, value))
+        refuse(name, value);
 }
 
 void source_writer::line(std::string_view name, std::int64_t number) {
@@ -39,14 +40,15 @@ void source_writer::optional_line(std::string_view name, std::int64_t number, st
 }
 
 void source_writer::line_of_any(std::string_view name, const std::vector<std::string> &values) {
-    for (const std::string &value : values) {
-        if (std::optional<std::string> written = attribute_line(name, value)) {
-            text += *written + "\n";
+    for (const std::string &value : values)
+        if (append_attribute_line(text, name, value))
             return;
-        }
-    }
+    refuse(name, values.empty() ? std::nullopt : std::optional<std::string_view>(values.front()));
+}
+
+void source_writer::refuse(std::string_view name, std::optional<std::string_view> value) const {
     no_source(current, "no line can give its " + std::string(name) + " (" +
-                           (values.empty() ? "a value without a text" : text::quoted_ascii(values.front())) + ")");
+                           (value ? text::quoted_ascii(*value) : "a value without a text") + ")");
 }
 
 } // namespace cdef::source

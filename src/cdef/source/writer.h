@@ -2,7 +2,10 @@
 #ifndef CDGEN_CDEF_SOURCE_WRITER_H
 #define CDGEN_CDEF_SOURCE_WRITER_H
 
+#include "cdef/source/error.h"
+
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -16,7 +19,7 @@ public:
     void comment(std::string_view text);
     void blank_line();
     /* place: named in messages about its lines. */
-    void stanza(std::string_view kind, std::string place);
+    void stanza(std::string_view kind, const record_name &place);
     void line(std::string_view name, std::string_view value);
     void line(std::string_view name, std::int64_t number);
     /* Writes no line for the number that the field has without one. */
@@ -27,7 +30,9 @@ public:
     std::string text;
 
 private:
-    std::string current; /* place of the stanza */
+    [[noreturn]] void refuse(std::string_view name, std::optional<std::string_view> value) const;
+
+    record_name current; /* of the stanza */
 };
 
 } // namespace cdef::source

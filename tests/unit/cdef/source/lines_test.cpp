@@ -47,7 +47,7 @@ std::string written(std::uint32_t text, std::uint16_t group, std::string refusal
     std::memcpy(record.data() + 20, &group, sizeof group);
     stanza_record from = {.record = {record, std::endian::native},
                           .strings = {std::as_bytes(std::span(strings)), std::endian::native},
-                          .place = "r 'x'",
+                          .place = place_of("r", "x"),
                           .no_optional_lines = std::move(refusal)};
     source_writer out;
     for (const stanza_line &line : lines_of(attributes, format))
@@ -75,8 +75,8 @@ TEST(SourceLines, OptionalLinesThatCannotFollowAreRefused) {
 
 TEST(SourceLines, PropertiesAreNames) {
     constexpr props_t known[] = {{"Two", 0x2}, {"One", 0x1}};
-    EXPECT_EQ(properties_text(0x3, known, ""), "Two,One");
-    EXPECT_THROW(properties_text(0x5, known, ""), no_source_error);
+    EXPECT_EQ(properties_text(0x3, known, {}), "Two,One");
+    EXPECT_THROW(properties_text(0x5, known, {}), no_source_error);
 }
 
 /* An attribute whose line differs from the text of its field needs a special function. */

@@ -8,7 +8,7 @@
 
 namespace {
 
-using cdef::source::attribute_line;
+using cdef::source::append_attribute_line;
 using cdef::source::is_default;
 using cdef::source::texts_of;
 
@@ -44,13 +44,23 @@ std::string binary(std::string_view bytes) {
     return made.append(bytes);
 }
 
+/* The line that is appended; nothing if there is none, and then nothing is appended. */
+std::optional<std::string> attribute_line(std::string_view name, std::string_view value) {
+    const std::string before = "ResourceClass\n";
+    std::string text = before;
+    bool is_appended = append_attribute_line(text, name, value);
+    EXPECT_TRUE(text.starts_with(before));
+    EXPECT_EQ(text.size() > before.size(), is_appended);
+    return is_appended ? std::optional(text.substr(before.size())) : std::nullopt;
+}
+
 TEST(SourceLine, IsIndented) {
-    EXPECT_EQ(attribute_line("Name", "Disk"), "\tName=Disk");
+    EXPECT_EQ(attribute_line("Name", "Disk"), "\tName=Disk\n");
 }
 
 TEST(SourceLine, IsQuotedWhereTheCompilerWouldCutIt) {
-    for (std::string value : {"a#b", "a//b", "a/*b", "a "})
-        EXPECT_EQ(attribute_line("Name", value), "\tName=\"" + value + "\"");
+    for (std::string value : {"a#b", "a//b", "a/*b", "a ", "a\t"})
+        EXPECT_EQ(attribute_line("Name", value), "\tName=\"" + value + "\"\n");
 }
 
 TEST(SourceLine, NoLineGivesNothingOrANewline) {

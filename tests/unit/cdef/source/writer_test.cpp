@@ -12,7 +12,7 @@ using namespace cdef::source;
 
 TEST(SourceWriter, WritesStanzasAndLines) {
     source_writer out;
-    out.stanza("ResourceClass", "ResourceClass 'C'");
+    out.stanza("ResourceClass", place_of("ResourceClass", "C"));
     out.line("Description", 5);
     out.optional_line("GroupID", 255, 255);
     out.blank_line();
@@ -35,6 +35,12 @@ TEST(SourceWriter, RefusesWhatNoLineSays) {
     } catch (const no_source_error &e) {
         EXPECT_STREQ(e.what(), "no source: ResourceClass 'C': no line can give its Name ('')");
     }
+}
+
+TEST(SourceWriter, NamesTheElementOfARecord) {
+    EXPECT_EQ(text_of(place_of("ActionInSDDefinition", "A").with_element("E")),
+              "ActionInSDDefinition 'A', element 'E'");
+    EXPECT_EQ(text_of({"ClassToManagerMapping"}), "ClassToManagerMapping");
 }
 
 } // namespace

@@ -292,10 +292,14 @@ TEST_F(ImageFile, ThatCannotBeMappedStaysFullOfZeros) {
     add_least();
     write_output(std::string(3000, 'x'));
     std::string message;
+    bool has_effect = false;
     {
         limit address_space(RLIMIT_AS, 0);
+        has_effect = mmap(nullptr, 4096, PROT_READ, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0) == MAP_FAILED;
         message = build();
     }
+    if (!has_effect)
+        GTEST_SKIP() << "an emulator may not pass the limit on";
     EXPECT_EQ(message, std::string("Cannot map CDB file: ") + strerror(ENOMEM));
     EXPECT_TRUE(same(blank(1024), contents()));
 }

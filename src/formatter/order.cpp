@@ -128,15 +128,19 @@ private:
 void put_in_order(std::vector<row> &rows, std::span<const line> lines, std::optional<std::size_t> fixed) {
     stanza_order stanzas(rows, lines);
     auto is_header = [](const line &each) { return each.kind == line_kind::header; };
+    /* Any line that is not taken apart may be the header of another stanza. */
+    auto ends_stanza = [](const line &each) {
+        return each.kind == line_kind::header || each.kind == line_kind::verbatim;
+    };
     auto header = std::find_if(lines.begin(), lines.end(), is_header);
     while (header != lines.end()) {
-        auto next = std::find_if(header + 1, lines.end(), is_header);
+        auto last = std::find_if(header + 1, lines.end(), ends_stanza);
         auto begin = static_cast<std::size_t>(header - lines.begin());
-        auto end = static_cast<std::size_t>(next - lines.begin());
+        auto end = static_cast<std::size_t>(last - lines.begin());
         int kind = set_table_id(header->text);
         if (kind >= 0 && (!fixed || *fixed < begin || *fixed >= end))
             stanzas.order(begin + 1, end, kind);
-        header = next;
+        header = std::find_if(last, lines.end(), is_header);
     }
 }
 

@@ -270,6 +270,18 @@ TEST(FormatOrder, LeavesAStanzaInWhichANumberOverflows) {
     EXPECT_EQ(after_class(kept, REORDERED), kept);
 }
 
+/* It may be the header of a stanza, which has other attributes. */
+TEST(FormatOrder, EndsWithALineThatIsNotTakenApart) {
+    constexpr std::string_view first = "\nResourceVariableClass\n\tVariableClass=S\n\tObservationInterval=9\n"
+                                       "\tReportingInterval=9\n\n";
+    constexpr std::string_view other = "\tReportingInterval=9\n\tObservationInterval=8\n\tVariableClass=T\n";
+    std::string by_return = std::string(first) + "ResourceVariableClass # \r \n" + std::string(other);
+    EXPECT_EQ(after_class(by_return, REORDERED), by_return);
+    std::string by_length =
+        std::string(first) + "# " + std::string(252, '-') + "ResourceVariableClass\n" + std::string(other);
+    EXPECT_EQ(after_class(by_length, REORDERED), by_length);
+}
+
 TEST(FormatOrder, TakesLinesWithoutAValueForComments) {
     EXPECT_EQ(after_class("\nResourceVariableClass\n\tNoSuch=\"\"\n\tObservationInterval=8\n\tReportingInterval=9\n"
                           "\tVariableClass=S\n",

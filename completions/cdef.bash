@@ -11,7 +11,9 @@ _cdef() {
     elif [[ $2 == = ]]; then
         current='' is='\[='
     fi
-    if [[ $option == --* ]]; then
+    if [[ $option == --warn || $option == --no-warn ]]; then
+        values="all $("$1" explain 2>/dev/null | sed -nE 's/^(S[0-9]+) .* \[([^]]+)\]$/\1 \2/p')"
+    elif [[ $option == --* ]]; then
         values=$("$1" ${subcommand:+"$subcommand"} --help 2>/dev/null |
             sed -nE "s/^  $option $is[A-Z]+:\{([^}]*)\}.*/\1/p" | tr , ' ')
     fi

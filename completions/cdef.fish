@@ -15,6 +15,11 @@ end
 
 function __cdef_values
     set -l option (commandline -opc)[-1]
+    if contains -- $option --warn --no-warn
+        echo all
+        cdef explain 2>/dev/null | sed -nE 's/^(S[0-9]+) .* \[([^]]+)\]$/\1 \2/p' | string split ' '
+        return
+    end
     string match --quiet -- '--*' $option
     and cdef (__cdef_subcommand) --help 2>/dev/null | sed -nE "s/^  $option [A-Z]+:\{([^}]*)\}.*/\1/p" | string split ,
 end

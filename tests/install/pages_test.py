@@ -6,7 +6,7 @@ import re
 import subprocess
 import unittest
 
-from installed import Case, program, run, tree
+from installed import Case, examples, program, run, tree
 from understood import options, options_of_cdgen, subcommands, values
 
 
@@ -62,9 +62,9 @@ class Options(unittest.TestCase):
         self.assertEqual({f"-{letter}" for letter in said}, options_of_cdgen())
 
     def test_of_cdef(self):
-        common, *parts = re.split(r"^\.It Cm ", self.page("cdef"), flags=re.M)
-        parts[-1], further = parts[-1].split("Further options:")
-        said = {part.split("\n")[0]: self.options_in(part) for part in parts}
+        described, further = self.page("cdef").split("Further options:")
+        parts = re.split(r"^\.It Cm ", described, flags=re.M)[1:]
+        said = {part.split()[0]: self.options_in(part) for part in parts}
         shared = self.options_in(further)
         self.assertEqual(shared, options())
         for subcommand in subcommands():
@@ -74,6 +74,8 @@ class Options(unittest.TestCase):
         said = self.page("cdef").split("explains, are\n")[1].split(".It ")[0]
         codes = {value for value in values("check")["--warn"] if re.fullmatch(r"S\d+", value)}
         self.assertEqual(set(re.findall(r"^\.Cm (\S+)", said, re.M)) | {"all"}, values("check")["--warn"] - codes)
+        accepted = [word for name in values("check")["--warn"] for word in ("--warn", name)]
+        run(program("cdef"), "check", *accepted, examples() / "Process.cdefsrc")
 
     def options_in(self, text):
         return {f"-{name}" for line in re.findall(r"^\.It Fl (.*)", text, re.M) for name in line.split(" , ")}

@@ -27,10 +27,19 @@ def subcommands():
     return set(re.findall(r"^  ([a-z]\S*)", help_of().split("Subcommands:\n")[1], re.M))
 
 
+def warnings():
+    """All codes and names of warnings about sources, which are too many for a help text."""
+    listed = re.findall(r"^(S\d+) .* \[(\S+)\]$", run(program("cdef"), "explain"), re.M)
+    return {word for pair in listed for word in pair}
+
+
 def values(*words):
-    """The words that an option can have, of each option that lists them in a help text."""
-    listed = re.findall(r"^  (-\S+) [A-Z]+:\{([^}]*)\}", help_of(*words), re.M)
-    return {option: set(found.split(",")) for option, found in listed}
+    """The words that an option can have, of each option that lists them in a help text, or that names a warning."""
+    text = help_of(*words)
+    known = {option: set(found.split(",")) for option, found in re.findall(r"^  (-\S+) [A-Z]+:\{([^}]*)\}", text, re.M)}
+    for option in re.findall(r"^  (--(?:no-)?warn) NAME", text, re.M):
+        known[option] = {"all"} | warnings()
+    return known
 
 
 def options(*words):

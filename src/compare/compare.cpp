@@ -68,15 +68,23 @@ private:
         report({.what = change::CHANGED, .path = path, .before = &was, .after = &is, .broken = broken});
     }
 
+    /* Most numbers are the same in both; this is seen without making facts of them. */
+    static bool is_same_number(const node &older, const node &newer, const cdb::field &f) {
+        return f.kind == cdb::field_kind::number && number_in(older, f) == number_in(newer, f);
+    }
+
     /* Both have the same kind, and therefore the same fields. */
     void compare_facts(const node &older, const node &newer) {
         if (older.kind == node_kind::element && older.index != newer.index)
             compare_fact(older, newer, {&ELEMENT_INDEX, static_cast<std::uint32_t>(older.index)},
                          {&ELEMENT_INDEX, static_cast<std::uint32_t>(newer.index)});
         std::size_t count = older.format == nullptr ? 0 : older.format->fields.size();
-        for (std::size_t i = 0; i < count; ++i)
+        for (std::size_t i = 0; i < count; ++i) {
+            if (is_same_number(older, newer, older.format->fields[i]))
+                continue;
             if (std::optional<fact> was = fact_in(older, i))
                 compare_fact(older, newer, *was, *fact_in(newer, i));
+        }
     }
 
     /* ---- Sections ---- */

@@ -156,13 +156,6 @@ node section_node(const origin &from, std::size_t index, section_tables &room) {
 
 /* ---- Facts ----------------------------------------------------------------------------------------------------- */
 
-/* A field that is not reversed is read as it is stored. */
-std::uint32_t number_in(const node &n, const cdb::field &f) {
-    cdb::bytes area = f.stays ? cdb::bytes(n.area.raw(), std::endian::native) : n.area;
-    bool is_short = f.width == sizeof(std::uint16_t);
-    return is_short ? area.number<std::uint16_t>(n.at + f.offset) : area.number<std::uint32_t>(n.at + f.offset);
-}
-
 std::string_view text_in(const node &n, const cdb::field &f) {
     std::uint32_t place = number_in(n, f);
     if (place == CDB_NONE || n.section == nullptr)

@@ -61,7 +61,11 @@ node section_node(const origin &from, std::size_t index, section_tables &room);
 /* ---- Facts ----------------------------------------------------------------------------------------------------- */
 
 /* The number in a field of the record, or in a part of a reference that is a number. */
-std::uint32_t number_in(const node &n, const cdb::field &f);
+inline std::uint32_t number_in(const node &n, const cdb::field &f) {
+    cdb::bytes area = f.stays ? cdb::bytes(n.area.raw(), std::endian::native) : n.area; /* stays: never reversed */
+    bool is_short = f.width == sizeof(std::uint16_t);
+    return is_short ? area.number<std::uint16_t>(n.at + f.offset) : area.number<std::uint32_t>(n.at + f.offset);
+}
 
 /* The text that a reference of the record leads to; empty if it leads to nothing. */
 std::string_view text_in(const node &n, const cdb::field &f);

@@ -16,6 +16,8 @@ namespace cdef::dump {
 
 namespace {
 
+using namespace std::string_view_literals;
+
 constexpr std::size_t BYTES_A_LINE = 16;
 constexpr std::size_t EXCERPT = 32; /* bytes of a text that a reference shows */
 
@@ -64,7 +66,7 @@ private:
     vx_data_type_t value_type(const cdb::region &r) const;
 
     std::string &meaning() {
-        return out.text += ": ";
+        return out.text += ": "sv;
     }
     void append_place(const cdb::bytes &area, std::size_t at);
     void append_excerpt(const cdb::bytes &strings, std::size_t at);
@@ -137,7 +139,7 @@ void append_offset(std::string &to, std::size_t offset) {
 void hex_form::append_place(const cdb::bytes &area, std::size_t at) {
     append_number(out.text, at);
     if (at < area.size())
-        append_offset(out.text += " at ", place_of(area) + at);
+        append_offset(out.text += " at "sv, place_of(area) + at);
 }
 
 /* Lists of valid values and arrays do not name the types of their values; the record that owns them does. */
@@ -189,7 +191,7 @@ void hex_form::append_value(const cdb::region &r, vx_data_type_t type) {
     auto word = db.file().number<std::uint32_t>(r.offset);
     meaning();
     if (word == CDB_NONE) {
-        out.text += "none";
+        out.text += "none"sv;
         return;
     }
     append_place(strings, word);
@@ -203,7 +205,7 @@ void hex_form::append_reference(const cdb::region &r) {
         return;
     meaning();
     if (word == CDB_NONE)
-        out.text += "none";
+        out.text += "none"sv;
     else if (r.what->to == cdb::target::none || meaning_of(r) == cdb::meaning::UNUSED)
         append_number(out.text, word);
     else if (r.what->to == cdb::target::section)
@@ -255,25 +257,28 @@ void hex_form::append_meaning(const cdb::region &r) {
 /* "section 2, rsrc_pattr_t 5, ra_props", as cdef verify calls it. Only records are counted. */
 void hex_form::append_name(const cdb::region &r) {
     if (r.section) {
-        append_number(out.text += "section ", *r.section);
-        out.text += ", ";
+        append_number(out.text += "section "sv, *r.section);
+        out.text += ", "sv;
     }
     out.text += r.record;
     if (r.what != nullptr || r.record == "vx_value_t" || r.record == "var_id_t")
         append_number(out.text += ' ', r.index);
     if (r.what != nullptr)
-        out.text.append(", ").append(r.what->name);
+        out.text.append(", "sv).append(r.what->name);
 }
 
 void hex_form::show_line(const cdb::region &r, std::size_t at) {
     append_offset(out.text, r.offset + at);
-    out.text += ' ';
-    std::size_t start = out.text.size();
-    for (std::byte b : db.file().part(r.offset + at, std::min(BYTES_A_LINE, r.size - at)).raw())
-        text::append_hex(out.text += ' ', std::span(&b, 1));
+    std::array<char, 1 + BYTES_A_LINE * 3 + 2> column; /* the bytes, and blanks around them */
+    column.fill(' ');
+    char *end = column.data() + 1;
+    for (std::byte b : db.file().part(r.offset + at, std::min(BYTES_A_LINE, r.size - at)).raw()) {
+        end[1] = text::HEX_DIGITS[std::to_integer<unsigned>(b) >> 4];
+        end[2] = text::HEX_DIGITS[std::to_integer<unsigned>(b) & 0xF];
+        end += 3;
+    }
+    out.text.append(column.data(), at == 0 ? column.data() + column.size() : end);
     if (at == 0) {
-        out.text.resize(start + BYTES_A_LINE * 3, ' ');
-        out.text += "  ";
         append_name(r);
         append_meaning(r);
     }

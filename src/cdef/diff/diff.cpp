@@ -19,7 +19,6 @@ namespace {
 
 using compare::change;
 using compare::difference;
-using compare::node_kind;
 
 struct diff_options {
     std::string before;

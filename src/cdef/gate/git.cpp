@@ -59,6 +59,7 @@ std::optional<std::string> git(const std::string &directory, const std::vector<s
     std::vector<std::string> words = {"git", "-C", directory.empty() ? "." : directory, "--no-pager"};
     words.insert(words.end(), arguments.begin(), arguments.end());
     std::vector<char *> argv;
+    argv.reserve(words.size() + 1);
     for (std::string &word : words)
         argv.push_back(word.data());
     argv.push_back(nullptr);

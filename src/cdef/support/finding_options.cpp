@@ -44,11 +44,11 @@ finding_rules finding_options::rules(const config::settings &settings) const {
     return all;
 }
 
-std::unique_ptr<report::writer> finding_options::writer(std::vector<report::rule> more) const {
+std::unique_ptr<report::writer> finding_options::writer(const std::vector<report::rule> &more) const {
     if (form == "json")
         return report::json_form(print);
     if (form == "sarif")
-        return report::sarif_form(print, std::move(more));
+        return report::sarif_form(print, more);
     if (form == "github")
         return report::github_form(print);
     if (form == "gitlab")

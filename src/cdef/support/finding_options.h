@@ -42,7 +42,7 @@ struct finding_options {
     finding_rules rules(const config::settings &settings) const;
     /* The object that writes findings in the chosen form: text to standard error, other forms to standard output. more:
      * rules that findings may break besides those of sources. */
-    std::unique_ptr<report::writer> writer(std::vector<report::rule> more = {}) const;
+    std::unique_ptr<report::writer> writer(const std::vector<report::rule> &more = {}) const;
     /* Reports a source that could not be read. why: a message that names the source. */
     void fail_source(report::writer &to, const std::string &why) const;
 };

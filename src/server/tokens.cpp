@@ -42,7 +42,6 @@ token_type type_of_value(int attr_type) {
         return TYPE;
     case AT_VARIABLE_TYPE:
     case AT_PERMISSION:
-        return ENUM_MEMBER;
     case AT_CLASS_PROPS:
     case AT_PATTR_PROPS:
     case AT_DATTR_PROPS:

@@ -36,11 +36,11 @@ void stepwise_compiler::open() {
 }
 
 void stepwise_compiler::open(int fd) {
-    take_source(cx, cx.options.cdefsrc, fd);
+    ::take_source(cx, cx.options.cdefsrc, fd);
 }
 
 void stepwise_compiler::open_bytes(std::string_view bytes) {
-    take_source(cx, bytes);
+    ::take_source(cx, bytes);
 }
 
 source_line stepwise_compiler::next_line() {
@@ -63,6 +63,16 @@ void stepwise_compiler::take_line(const attr_text &text) {
             before;
         throw;
     }
+}
+
+void stepwise_compiler::take_source(std::string_view bytes) {
+    open_bytes(bytes);
+    for (source_line line = next_line(); line.begin != nullptr; line = next_line())
+        if (attr_text text = text_of(line); text.end != nullptr)
+            take_line(text);
+    close();
+    for (size_t step = 0; step < closing_steps(); ++step)
+        take_closing_step(step);
 }
 
 size_t stepwise_compiler::closing_steps() {

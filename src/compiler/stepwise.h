@@ -5,6 +5,14 @@
 
 #include "compiler/cdgen_read.h"
 
+/* For callers that only want the compilation. */
+struct no_observer final : line_observer {
+    void attribute_read(const attr_place &) override {}
+    bool excuses_missing(int) const override {
+        return false;
+    }
+};
+
 class stepwise_compiler {
 public:
     /* The names must stay as long as the compiler. Nothing is written to the output, but a class without a Name is
@@ -24,6 +32,9 @@ public:
     /* A header, if no blank is in front, or an attribute line, which is taken apart. If a header fails, the stanza
      * before it is still the current one. */
     void take_line(const attr_text &text);
+
+    /* A source in memory, from its first line to the last closing step. */
+    void take_source(std::string_view bytes);
 
     /* The steps at the end of the source, to be taken in this order. */
     static size_t closing_steps();

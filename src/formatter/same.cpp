@@ -31,15 +31,6 @@ void remove_time(std::vector<std::byte> &image) {
     std::memcpy(image.data(), &header, sizeof header);
 }
 
-/* Looks on without deciding anything. */
-class onlooker : public line_observer {
-public:
-    void attribute_read(const attr_place &) override {}
-    bool excuses_missing(int) const override {
-        return false;
-    }
-};
-
 } // namespace
 
 compiled compile(std::string_view source, const std::string &name) {
@@ -65,7 +56,7 @@ bool is_same(const compiled &a, const compiled &b) {
 }
 
 std::optional<std::size_t> first_overflow(std::string_view source) {
-    onlooker observer;
+    no_observer observer;
     auto compiler = std::make_unique<stepwise_compiler>("", OUTPUT, observer); /* large */
     compiler->open_bytes(source);
     std::size_t at = 0;

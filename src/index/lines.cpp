@@ -11,14 +11,6 @@ namespace source_index {
 
 namespace {
 
-/* For a compiler that takes no attribute. */
-struct no_observer : line_observer {
-    void attribute_read(const attr_place &) override {}
-    bool excuses_missing(int) const override {
-        return true;
-    }
-};
-
 line_kind kind_of(const line &of) {
     if (of.text.is_empty())
         return of.whole.is_empty() ? line_kind::empty : line_kind::comment;

@@ -1,4 +1,4 @@
-/* json.cpp: findings as JSON. docs/check.md describes it, and share/cdef-check.schema.json is its schema. */
+/* json.cpp: findings as JSON. docs/check.md describes it, and schema/cdef-check.schema.json is its schema. */
 
 #include "report/places.h"
 #include "report/report.h"

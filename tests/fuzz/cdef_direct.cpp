@@ -118,34 +118,13 @@ void compare_directly(const bytes &before, const bytes &after) {
 
 namespace {
 
-struct no_observer final : line_observer {
-    void attribute_read(const attr_place &) override {}
-    bool excuses_missing(int) const override {
-        return false;
-    }
-};
-
-void take_everything(stepwise_compiler &compiler, std::string_view source) {
-    compiler.open_bytes(source);
-    for (;;) {
-        source_line line = compiler.next_line();
-        if (line.begin == nullptr)
-            break;
-        if (attr_text text = text_of(line); text.end != nullptr)
-            compiler.take_line(text);
-    }
-    compiler.close();
-    for (std::size_t step = 0; step < stepwise_compiler::closing_steps(); ++step)
-        compiler.take_closing_step(step);
-    compiler.image();
-}
-
 /* The compiler's message, as it is printed; empty if the source compiles. */
 std::string message_of_compiler(std::string_view source, const std::string &output) {
     no_observer observer;
     auto compiler = std::make_unique<stepwise_compiler>("source", output.c_str(), observer);
     try {
-        take_everything(*compiler, source);
+        compiler->take_source(source);
+        compiler->image();
     } catch (const fatal_exit &failure) {
         std::string message;
         for (const char *part : words_of(failure))

@@ -21,23 +21,6 @@ using compare::change;
 using compare::difference;
 using compare::node;
 
-struct no_observer final : line_observer {
-    void attribute_read(const attr_place &) override {}
-    bool excuses_missing(int) const override {
-        return false;
-    }
-};
-
-void take_lines(stepwise_compiler &compiler) {
-    for (;;) {
-        source_line line = compiler.next_line();
-        if (line.begin == nullptr)
-            return;
-        if (attr_text text = text_of(line); text.end != nullptr)
-            compiler.take_line(text);
-    }
-}
-
 std::string words_of_failure(const fatal_exit &failure) {
     std::string words = failure.line == 0 ? "" : "line " + std::to_string(failure.line) + ": ";
     for (const char *part : words_of(failure))
@@ -45,21 +28,13 @@ std::string words_of_failure(const fatal_exit &failure) {
     return text::escaped(words);
 }
 
-std::vector<std::byte> image_of(stepwise_compiler &compiler, std::string_view text) {
-    compiler.open_bytes(text);
-    take_lines(compiler);
-    compiler.close();
-    for (std::size_t step = 0; step < stepwise_compiler::closing_steps(); ++step)
-        compiler.take_closing_step(step);
-    return compiler.image();
-}
-
 /* The details of a failure may belong to the compiler, so they are read while it exists. */
 std::vector<std::byte> compiled(std::string_view text, const std::string &output) {
     no_observer observer;
     auto compiler = std::make_unique<stepwise_compiler>("source", output.c_str(), observer);
     try {
-        return image_of(*compiler, text);
+        compiler->take_source(text);
+        return compiler->image();
     } catch (const fatal_exit &failure) {
         no_source("database", "its source would not compile: " + words_of_failure(failure));
     }

@@ -12,26 +12,11 @@
 
 namespace compiled {
 
-struct no_observer final : line_observer {
-    void attribute_read(const attr_place &) override {}
-    bool excuses_missing(int) const override {
-        return false;
-    }
-};
-
 /* The database that a source compiles to. */
 inline std::vector<std::byte> image_of(const std::string &text) {
     no_observer observer;
     stepwise_compiler compiler("source", "C.cdef", observer);
-    compiler.open_bytes(text);
-    for (;;) {
-        source_line line = compiler.next_line();
-        if (line.begin == nullptr)
-            break;
-        compiler.take_line(text_of(line));
-    }
-    for (std::size_t step = 0; step < stepwise_compiler::closing_steps(); ++step)
-        compiler.take_closing_step(step);
+    compiler.take_source(text);
     return compiler.image();
 }
 

@@ -5,6 +5,7 @@
 #include <gtest/gtest.h>
 
 #include <cstring>
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -104,6 +105,27 @@ TEST_F(Stepwise, ElementsOfNobodyAreTakenAllTheSame) {
     EXPECT_EQ(failing("\tElementIndex=1"), MSG_INDEX_NOT_CONSECUTIVE);
     compiler.expect_index(2);
     EXPECT_EQ(failing("\tElementName=E"), NO_MESSAGE);
+}
+
+TEST_F(Stepwise, SourceIsTakenFromItsFirstLineToTheLastClosingStep) {
+    no_observer nobody;
+    auto other = std::make_unique<stepwise_compiler>("source", "Out.cdef", nobody);
+    other->take_source("# a comment\nControlDefinition\n\tFileVersion=7\n"
+                       "ClassToManagerMapping\n\tResourceManager=M\n\tFirstKey=1\n\tLastKey=9\n"
+                       "\tDescriptiveMessageSet=1");
+    std::vector<std::byte> image = other->image();
+    orb_cdb_header_t header;
+    ASSERT_GE(image.size(), sizeof header);
+    std::memcpy(&header, image.data(), sizeof header);
+    EXPECT_EQ(header.cdb_hdr_length, image.size() - 4);
+}
+
+TEST_F(Stepwise, SourceThatLacksARequiredAttributeFailsInAClosingStep) {
+    no_observer nobody;
+    auto other = std::make_unique<stepwise_compiler>("source", "Out.cdef", nobody);
+    testing::internal::CaptureStdout();
+    EXPECT_THROW(other->take_source("ControlDefinition\nDynamicClassAttribute\n"), fatal_exit);
+    EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
 }
 
 TEST_F(Stepwise, OverflowIsRememberedUntilItIsForgotten) {

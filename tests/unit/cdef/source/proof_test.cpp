@@ -3,18 +3,11 @@
 #include "cdef/source/proof.h"
 
 #include "cdef/source/error.h"
-#include "compiler/stepwise.h"
+#include "compare/compiled.h"
 
 #include <gtest/gtest.h>
 
 namespace {
-
-struct no_observer final : line_observer {
-    void attribute_read(const attr_place &) override {}
-    bool excuses_missing(int) const override {
-        return false;
-    }
-};
 
 std::string source_with(const std::string &last_key) {
     return "ControlDefinition\n\tFileVersion=1\n"
@@ -22,24 +15,9 @@ std::string source_with(const std::string &last_key) {
            last_key + "\n\tDescriptiveMessageSet=1\n";
 }
 
-std::vector<std::byte> compiled(const std::string &text) {
-    no_observer observer;
-    stepwise_compiler compiler("source", "C.cdef", observer);
-    compiler.open_bytes(text);
-    for (;;) {
-        source_line line = compiler.next_line();
-        if (line.begin == nullptr)
-            break;
-        compiler.take_line(text_of(line));
-    }
-    for (std::size_t step = 0; step < stepwise_compiler::closing_steps(); ++step)
-        compiler.take_closing_step(step);
-    return compiler.image();
-}
-
 /* What the proof says of a text as the source of a database with LastKey 9; empty if it is one. */
 std::string refusal_of(const std::string &text, const std::string &output = "C.cdef") {
-    std::vector<std::byte> image = compiled(source_with("9"));
+    std::vector<std::byte> image = compiled::image_of(source_with("9"));
     cdb::database db(image);
     cdb::ownership owners(db, {});
     try {

@@ -15,11 +15,36 @@
 enum { BUFFER = 65536, SLOTS = 256, FIELDS = 32 };
 
 static const char *const names[] = {
-    "Name", "Description", "DisplayName", "Id", "DataType", "VariableType", "VarietyRange", "GroupID", "GroupName",
-    "Properties", "Range", "InitialValue", "ValidValue", "ValueDisplayName", "DefaultValue", "FileVersion",
-    "ClassPermTemplate", "ResourcePermTemplate", "ResourceManager", "FirstKey", "LastKey", "MessageCatalog",
-    "DescriptiveMessageSet", "DynamicClassAttribute", "DynamicResourceAttribute", "PersistentClassAttribute",
-    "PersistentResourceAttribute", "ControlDefinition", "ResourceClass", "ClassToManagerMapping",
+    "Name",
+    "Description",
+    "DisplayName",
+    "Id",
+    "DataType",
+    "VariableType",
+    "VarietyRange",
+    "GroupID",
+    "GroupName",
+    "Properties",
+    "Range",
+    "InitialValue",
+    "ValidValue",
+    "ValueDisplayName",
+    "DefaultValue",
+    "FileVersion",
+    "ClassPermTemplate",
+    "ResourcePermTemplate",
+    "ResourceManager",
+    "FirstKey",
+    "LastKey",
+    "MessageCatalog",
+    "DescriptiveMessageSet",
+    "DynamicClassAttribute",
+    "DynamicResourceAttribute",
+    "PersistentClassAttribute",
+    "PersistentResourceAttribute",
+    "ControlDefinition",
+    "ResourceClass",
+    "ClassToManagerMapping",
 };
 
 /* A name's position by a hash of its length and three characters; names that share a slot follow each other. */
@@ -136,7 +161,8 @@ int main(int argc, char **argv) {
     for (ssize_t n = 0; (n = read(in, buffer + begun, BUFFER - begun)) > 0;) {
         const char *line = buffer;
         const char *end = buffer + begun + n;
-        for (const char *newline = NULL; (newline = memchr(line, '\n', (size_t)(end - line))) != NULL; line = newline + 1)
+        for (const char *newline = NULL; (newline = memchr(line, '\n', (size_t)(end - line))) != NULL;
+             line = newline + 1)
             take_line(line, (size_t)(newline - line));
         begun = (size_t)(end - line);
         memmove(buffer, line, begun);

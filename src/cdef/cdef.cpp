@@ -1,6 +1,7 @@
 /* cdef.cpp: the command line of cdef, which shows what is in a class definition database. */
 
 #include "cdef/cdef.h"
+#include "cdef/support/command.h"
 #include "cdef/support/failure.h"
 #include "text/shown.h"
 
@@ -65,9 +66,10 @@ int run(int argc, char **argv) {
         return "cdef: " + text::escaped(complaint(*program, usage)) + "\nRun 'cdef --help' for more.\n";
     });
     int status = OK;
+    program to(app, status);
     for (auto add : {add_verify, add_dump, add_diff, add_source, add_check, add_format, add_build, add_gate, add_new,
                      add_explain, add_lsp})
-        add(app, status);
+        add(to);
     unshield_arguments(app);
     try {
         app.parse(shielded(argc, argv));

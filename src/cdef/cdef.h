@@ -2,24 +2,22 @@
 #ifndef CDGEN_CDEF_H
 #define CDGEN_CDEF_H
 
-namespace CLI {
-class App;
-}
-
 namespace cdef {
 
-/* Each adds its subcommand to the program. When it runs, it sets status. */
-void add_verify(CLI::App &app, int &status);
-void add_source(CLI::App &app, int &status);
-void add_diff(CLI::App &app, int &status);
-void add_dump(CLI::App &app, int &status);
-void add_build(CLI::App &app, int &status);
-void add_check(CLI::App &app, int &status);
-void add_format(CLI::App &app, int &status);
-void add_gate(CLI::App &app, int &status);
-void add_new(CLI::App &app, int &status);
-void add_explain(CLI::App &app, int &status);
-void add_lsp(CLI::App &app, int &status);
+class program;
+
+/* Each adds its subcommand to the program. */
+void add_verify(program &to);
+void add_source(program &to);
+void add_diff(program &to);
+void add_dump(program &to);
+void add_build(program &to);
+void add_check(program &to);
+void add_format(program &to);
+void add_gate(program &to);
+void add_new(program &to);
+void add_explain(program &to);
+void add_lsp(program &to);
 
 /* The program; returns its exit status. */
 int cdef_main(int argc, char **argv);

@@ -5,13 +5,12 @@
 #include "build/dependencies.h"
 #include "cdef/build/workers.h"
 #include "cdef/cdef.h"
+#include "cdef/support/command.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/output.h"
 #include "cdef/support/replacement.h"
 #include "cdef/support/sources.h"
 #include "cdef/support/status.h"
-
-#include <CLI/CLI.hpp>
 
 #include <algorithm>
 #include <csignal>
@@ -149,31 +148,35 @@ int build_or_refuse(const build_options &options) {
     }
 }
 
-void add_options(CLI::App &command, build_options &options) {
-    command.add_option("SOURCE", options.operands, "Source, or directory of sources (*.cdefsrc); - is standard input")
-        ->required();
-    auto *file = command.add_option("-o,--output", options.file, "The database; - is standard output");
-    command.add_option("-d,--directory", options.directory, "Put all databases into DIRECTORY")->excludes(file);
-    command.add_option("--byte-order", options.order, "native, little, big or both (NAME.le.cdef and NAME.be.cdef)")
-        ->check(CLI::IsMember(byte_orders));
-    command.add_option("--timestamp", options.timestamp,
-                       "Time in the database: none, now or SECONDS since 1970; SOURCE_DATE_EPOCH if it is set");
-    command.add_option("--depfile", options.depfile, "Write to FILE what the databases depend on, as Make reads it");
-    command.add_option("-j,--jobs", options.jobs, "Compile this many sources at once")
-        ->check(CLI::Range(1U, build_command::MOST_JOBS));
-    command.add_flag("--sync", options.sync, "Wait until each database is on the disk before it replaces the old one");
-    command.add_flag("--list", options.list, "List the databases and build none");
-    add_finding_options(command, options.findings);
+std::vector<std::string> names_of_orders() {
+    std::vector<std::string> names;
+    for (const auto &[name, order] : byte_orders)
+        names.push_back(name);
+    return names;
+}
+
+void add_options(command &to, build_options &options) {
+    to.add("SOURCE", options.operands, "Source, or directory of sources (*.cdefsrc); - is standard input").required();
+    option file = to.add("-o,--output", options.file, "The database; - is standard output");
+    to.add("-d,--directory", options.directory, "Put all databases into DIRECTORY").excludes(file);
+    to.add("--byte-order", options.order, "native, little, big or both (NAME.le.cdef and NAME.be.cdef)")
+        .one_of(names_of_orders());
+    to.add("--timestamp", options.timestamp,
+           "Time in the database: none, now or SECONDS since 1970; SOURCE_DATE_EPOCH if it is set");
+    to.add("--depfile", options.depfile, "Write to FILE what the databases depend on, as Make reads it");
+    to.add_number("-j,--jobs", options.jobs, build_command::MOST_JOBS, "Compile this many sources at once");
+    to.add_flag("--sync", options.sync, "Wait until each database is on the disk before it replaces the old one");
+    to.add_flag("--list", options.list, "List the databases and build none");
+    add_finding_options(to, options.findings);
 }
 
 } // namespace
 
-void add_build(CLI::App &app, int &status) {
+void add_build(program &app) {
     auto options = std::make_shared<build_options>();
-    CLI::App *command = app.add_subcommand("build", "Checks sources and builds their databases");
-    add_options(*command, *options);
-    command->footer(status_help("build"));
-    command->callback([options, &status] { status = build_or_refuse(*options); });
+    command made =
+        app.add("build", "Checks sources and builds their databases", [options] { return build_or_refuse(*options); });
+    add_options(made, *options);
 }
 
 } // namespace cdef

@@ -4,10 +4,9 @@
 
 #include "cdef/cdef.h"
 #include "cdef/check/fix.h"
+#include "cdef/support/command.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/finding_options.h"
-
-#include <CLI/CLI.hpp>
 
 #include <algorithm>
 #include <memory>
@@ -75,15 +74,14 @@ int check_all(const check_options &options) {
 
 } // namespace
 
-void add_check(CLI::App &app, int &status) {
+void add_check(program &app) {
     auto options = std::make_shared<check_options>();
-    CLI::App *command = app.add_subcommand("check", "Checks sources and reports every mistake, not just the first");
-    command->add_option("SOURCE", options->sources, "Source to check; - is standard input")->required();
-    add_finding_options(*command, options->findings);
-    CLI::Option *fix = command->add_flag("--fix", options->fixes, "Make the corrections that are certain");
-    command->add_flag("--dry-run", options->changes_nothing, "Show as a diff what --fix would change")->needs(fix);
-    command->footer(status_help("check"));
-    command->callback([options, &status] { status = check_all(*options); });
+    command made = app.add("check", "Checks sources and reports every mistake, not just the first",
+                           [options] { return check_all(*options); });
+    made.add("SOURCE", options->sources, "Source to check; - is standard input").required();
+    add_finding_options(made, options->findings);
+    option fix = made.add_flag("--fix", options->fixes, "Make the corrections that are certain");
+    made.add_flag("--dry-run", options->changes_nothing, "Show as a diff what --fix would change").needs(fix);
 }
 
 } // namespace cdef

@@ -2,13 +2,12 @@
 
 #include "cdef/cdef.h"
 #include "cdef/diff/document.h"
+#include "cdef/support/command.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/forms.h"
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
 #include "compare/describe.h"
-
-#include <CLI/CLI.hpp>
 
 #include <algorithm>
 #include <memory>
@@ -203,20 +202,18 @@ int run(const diff_options &options) {
 
 } // namespace
 
-void add_diff(CLI::App &app, int &status) {
+void add_diff(program &app) {
     auto options = std::make_shared<diff_options>();
-    CLI::App *command = app.add_subcommand("diff", "Shows how two databases differ in meaning, not in layout");
-    command->add_option("A", options->before, "First database; - is standard input")->required();
-    command->add_option("B", options->after, "Second database; - is standard input")->required();
-    command
-        ->add_flag("--compat", options->compat,
-                   "Show only differences that break what relies on A, and why: readers (the default), also clients, "
-                   "also stored values")
-        ->check(check_level)
-        ->option_text("[=LEVEL:{readers,clients,stored}]");
-    add_forms(*command, options->form, {"text", "json"}, "Form of the differences: text or json");
-    command->footer(status_help("diff"));
-    command->callback([options, &status] { status = run(*options); });
+    command made = app.add("diff", "Shows how two databases differ in meaning, not in layout",
+                           [options] { return run(*options); });
+    made.add("A", options->before, "First database; - is standard input").required();
+    made.add("B", options->after, "Second database; - is standard input").required();
+    made.add_flag("--compat", options->compat,
+                  "Show only differences that break what relies on A, and why: readers (the default), also clients, "
+                  "also stored values")
+        .checked(check_level)
+        .shown_as("[=LEVEL:{readers,clients,stored}]");
+    add_forms(made, options->form, {"text", "json"}, "Form of the differences: text or json");
 }
 
 } // namespace cdef

@@ -2,11 +2,10 @@
 
 #include "cdef/dump/dump.h"
 #include "cdef/cdef.h"
+#include "cdef/support/command.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/forms.h"
 #include "cdef/support/output.h"
-
-#include <CLI/CLI.hpp>
 
 #include <memory>
 #include <unistd.h>
@@ -37,19 +36,17 @@ void run(const dump_options &options) {
 
 } // namespace
 
-void add_dump(CLI::App &app, int &status) {
+void add_dump(program &app) {
     auto options = std::make_shared<dump_options>();
-    CLI::App *command = app.add_subcommand("dump", "Shows what is in a database");
-    command->add_option("FILE", options->file, "Database to show; - is standard input")->required();
-    add_forms(*command, options->form, {"text", "json", "hex"},
-              "Form of what is shown: text, json, or hex: every byte and what it is, even of a damaged file");
-    add_colour(*command, options->colour);
-    command->add_flag("--offsets", options->with_offsets, "Also show the offset of each record and list");
-    command->footer(status_help("dump"));
-    command->callback([options, &status] {
+    command made = app.add("dump", "Shows what is in a database", [options] {
         run(*options);
-        status = OK;
+        return OK;
     });
+    made.add("FILE", options->file, "Database to show; - is standard input").required();
+    add_forms(made, options->form, {"text", "json", "hex"},
+              "Form of what is shown: text, json, or hex: every byte and what it is, even of a damaged file");
+    add_colour(made, options->colour);
+    made.add_flag("--offsets", options->with_offsets, "Also show the offset of each record and list");
 }
 
 } // namespace cdef

@@ -2,13 +2,12 @@
 
 #include "cdef/cdef.h"
 #include "cdef/explain/codes.h"
+#include "cdef/support/command.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/forms.h"
 #include "cdef/support/output.h"
 #include "report/json_writer.h"
 #include "text/shown.h"
-
-#include <CLI/CLI.hpp>
 
 #include <cstddef>
 #include <memory>
@@ -154,14 +153,12 @@ int explain(const explain_options &options) {
 
 } // namespace
 
-void add_explain(CLI::App &app, int &status) {
+void add_explain(program &app) {
     auto options = std::make_shared<explain_options>();
-    CLI::App *command = app.add_subcommand("explain", "Explains the codes of findings: cause, cure and an example");
-    command->add_option("CODE", options->codes,
-                        "Code such as S101 or CDB104, or a warning's name; without one, all are listed");
-    add_forms(*command, options->form, {"text", "json"}, "Form: text or json");
-    command->footer(status_help("explain"));
-    command->callback([options, &status] { status = explain(*options); });
+    command made = app.add("explain", "Explains the codes of findings: cause, cure and an example",
+                           [options] { return explain(*options); });
+    made.add("CODE", options->codes, "Code such as S101 or CDB104, or a warning's name; without one, all are listed");
+    add_forms(made, options->form, {"text", "json"}, "Form: text or json");
 }
 
 } // namespace cdef

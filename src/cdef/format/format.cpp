@@ -3,6 +3,7 @@
 #include "formatter/format.h"
 
 #include "cdef/cdef.h"
+#include "cdef/support/command.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/finding_options.h"
 #include "cdef/support/output.h"
@@ -11,8 +12,6 @@
 #include "cdef/support/status.h"
 #include "report/report.h"
 #include "text/shown.h"
-
-#include <CLI/CLI.hpp>
 
 #include <algorithm>
 #include <cstdio>
@@ -83,26 +82,22 @@ int format_all(const format_options &options) {
 
 } // namespace
 
-void add_format(CLI::App &app, int &status) {
+void add_format(program &app) {
     auto options = std::make_shared<format_options>();
-    CLI::App *command =
-        app.add_subcommand("format", "Puts sources into a uniform layout without changing their meaning");
-    command->add_option("SOURCE", options->sources, "Source to format; - is standard input")->required();
-    auto *in_place = command->add_flag("-i,--in-place", options->in_place,
-                                       "Replace the sources; without it, formatted sources go to standard output");
-    auto *checks = command->add_flag("--check", options->checks, "Only list the sources that would change");
-    auto *diffs = command->add_flag("--diff", options->diffs, "Only show what would change, as a diff");
-    in_place->excludes(checks)->excludes(diffs);
-    checks->excludes(diffs);
-    command->add_flag("--reorder", options->reorder,
-                      "Also put attributes into their usual order, where the order has no meaning");
-    command->footer("Examples:\n"
-                    "  cdef format disk.cdefsrc | less     show the result\n"
-                    "  cdef format -i *.cdefsrc            format these sources\n"
-                    "  cdef format --check *.cdefsrc       in a build: list sources that are not formatted\n"
-                    "\n" +
-                    status_help("format"));
-    command->callback([options, &status] { status = format_all(*options); });
+    command made = app.add("format", "Puts sources into a uniform layout without changing their meaning",
+                           [options] { return format_all(*options); });
+    made.add("SOURCE", options->sources, "Source to format; - is standard input").required();
+    option in_place = made.add_flag("-i,--in-place", options->in_place,
+                                    "Replace the sources; without it, formatted sources go to standard output");
+    option checks = made.add_flag("--check", options->checks, "Only list the sources that would change");
+    option diffs = made.add_flag("--diff", options->diffs, "Only show what would change, as a diff");
+    in_place.excludes(checks).excludes(diffs);
+    checks.excludes(diffs);
+    made.add_flag("--reorder", options->reorder,
+                  "Also put attributes into their usual order, where the order has no meaning");
+    made.show_examples("  cdef format disk.cdefsrc | less     show the result\n"
+                       "  cdef format -i *.cdefsrc            format these sources\n"
+                       "  cdef format --check *.cdefsrc       in a build: list sources that are not formatted\n");
 }
 
 } // namespace cdef

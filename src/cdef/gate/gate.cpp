@@ -3,6 +3,7 @@
 #include "cdef/cdef.h"
 #include "cdef/gate/baseline.h"
 #include "cdef/gate/ids_file.h"
+#include "cdef/support/command.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/finding_options.h"
 #include "cdef/support/input.h"
@@ -11,8 +12,6 @@
 #include "compare/writer.h"
 #include "gate/compiled.h"
 #include "gate/judge.h"
-
-#include <CLI/CLI.hpp>
 
 #include <algorithm>
 #include <map>
@@ -240,24 +239,20 @@ int gate_run::run() {
 
 } // namespace
 
-void add_gate(CLI::App &app, int &status) {
+void add_gate(program &app) {
     auto options = std::make_shared<gate_options>();
-    CLI::App *command =
-        app.add_subcommand("gate", "Reports what breaks programs or data that rely on an older version of a class");
-    command
-        ->add_option("SOURCE", options->operands,
-                     "Source or database, or directory of sources (*.cdefsrc); - is standard input")
-        ->required();
-    command->add_option("--against", options->against,
-                        "The older version: a file, a directory, or git:REVISION[:PATH]");
-    command->add_option("--level", options->level, "What relies on it; each level includes those before")
-        ->check(CLI::IsMember({"readers", "clients", "stored"}));
-    command->add_option("--ids", options->ids, "File of all numbers that have been in use; the default is ids.lock");
-    command->add_flag("--update", options->update, "Record the numbers in that file, even those that contradict it");
-    add_report_options(*command, options->findings);
-    add_project_rules(*command, options->findings);
-    command->footer(status_help("gate"));
-    command->callback([options, &status] { status = gate_run(*options).run(); });
+    command made = app.add("gate", "Reports what breaks programs or data that rely on an older version of a class",
+                           [options] { return gate_run(*options).run(); });
+    made.add("SOURCE", options->operands,
+             "Source or database, or directory of sources (*.cdefsrc); - is standard input")
+        .required();
+    made.add("--against", options->against, "The older version: a file, a directory, or git:REVISION[:PATH]");
+    made.add("--level", options->level, "What relies on it; each level includes those before")
+        .one_of({"readers", "clients", "stored"});
+    made.add("--ids", options->ids, "File of all numbers that have been in use; the default is ids.lock");
+    made.add_flag("--update", options->update, "Record the numbers in that file, even those that contradict it");
+    add_report_options(made, options->findings);
+    add_project_rules(made, options->findings);
 }
 
 } // namespace cdef

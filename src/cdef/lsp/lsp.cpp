@@ -2,14 +2,13 @@
 
 #include "cdef/cdef.h"
 #include "cdef/lsp/files.h"
+#include "cdef/support/command.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/output.h"
 #include "cdef/support/project_files.h"
 #include "cdef/support/status.h"
 #include "server/framing.h"
 #include "server/server.h"
-
-#include <CLI/CLI.hpp>
 
 #include <array>
 #include <cerrno>
@@ -109,15 +108,14 @@ int connection::serve() {
 
 } // namespace
 
-void add_lsp(CLI::App &app, int &status) {
+void add_lsp(program &app) {
     auto options = std::make_shared<lsp_options>();
-    CLI::App *command = app.add_subcommand("lsp", "Serves editors: the Language Server Protocol on standard streams");
-    command->add_flag("--stdio", options->standard_streams, "Ignored: there is no other way to connect");
-    command->add_option("--explanations", options->explanations,
-                        "URI of the page that explains the codes, instead of the installed one");
-    add_project_options(*command, options->project);
-    command->footer(status_help("lsp"));
-    command->callback([options, &status] { status = connection(*options).serve(); });
+    command made = app.add("lsp", "Serves editors: the Language Server Protocol on standard streams",
+                           [options] { return connection(*options).serve(); });
+    made.add_flag("--stdio", options->standard_streams, "Ignored: there is no other way to connect");
+    made.add("--explanations", options->explanations,
+             "URI of the page that explains the codes, instead of the installed one");
+    add_project_options(made, options->project);
 }
 
 } // namespace cdef

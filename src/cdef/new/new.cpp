@@ -2,10 +2,9 @@
 
 #include "cdef/cdef.h"
 #include "cdef/new/first_source.h"
+#include "cdef/support/command.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/output.h"
-
-#include <CLI/CLI.hpp>
 
 #include <cerrno>
 #include <csignal>
@@ -66,15 +65,14 @@ int write_first_source(const new_options &options) {
 
 } // namespace
 
-void add_new(CLI::App &app, int &status) {
+void add_new(program &app) {
     auto options = std::make_shared<new_options>();
-    CLI::App *command = app.add_subcommand("new", "Writes a source to start a new class from");
-    command->add_option("KIND", options->kind, "What to write: class")->required()->check(CLI::IsMember({"class"}));
-    command->add_option("NAME", options->name, "Name of the class")->required();
-    command->add_option("-o,--output", options->file,
-                        "The source, which must not exist; NAME.cdefsrc if left out; - is standard output");
-    command->footer(status_help("new"));
-    command->callback([options, &status] { status = write_first_source(*options); });
+    command made =
+        app.add("new", "Writes a source to start a new class from", [options] { return write_first_source(*options); });
+    made.add("KIND", options->kind, "What to write: class").required().one_of({"class"});
+    made.add("NAME", options->name, "Name of the class").required();
+    made.add("-o,--output", options->file,
+             "The source, which must not exist; NAME.cdefsrc if left out; - is standard output");
 }
 
 } // namespace cdef

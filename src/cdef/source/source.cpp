@@ -3,12 +3,11 @@
 #include "cdef/cdef.h"
 #include "cdef/source/compose.h"
 #include "cdef/source/error.h"
+#include "cdef/support/command.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
 #include "text/shown.h"
-
-#include <CLI/CLI.hpp>
 
 #include <memory>
 #include <unistd.h>
@@ -46,13 +45,11 @@ int run(const std::string &path) {
 
 } // namespace
 
-void add_source(CLI::App &app, int &status) {
+void add_source(program &app) {
     auto path = std::make_shared<std::string>();
-    CLI::App *command =
-        app.add_subcommand("source", "Writes a source that compiles to a database with the same meaning");
-    command->add_option("FILE", *path, "Database to turn into a source; - is standard input")->required();
-    command->footer(status_help("source"));
-    command->callback([path, &status] { status = run(*path); });
+    command made = app.add("source", "Writes a source that compiles to a database with the same meaning",
+                           [path] { return run(*path); });
+    made.add("FILE", *path, "Database to turn into a source; - is standard input").required();
 }
 
 } // namespace cdef

@@ -8,8 +8,6 @@
 #include "cdef/support/output.h"
 #include "check/switches.h"
 
-#include <CLI/CLI.hpp>
-
 #include <cstdio>
 #include <string_view>
 #include <unistd.h>
@@ -64,38 +62,34 @@ void finding_options::fail_source(report::writer &to, const std::string &why) co
     to.fail_source(why);
 }
 
-void add_report_options(CLI::App &command, finding_options &options) {
-    add_forms(command, options.form, {"text", "json", "sarif", "github", "gitlab"},
+void add_report_options(command &to, finding_options &options) {
+    add_forms(to, options.form, {"text", "json", "sarif", "github", "gitlab"},
               "Form of the findings; text is written to standard error");
-    command.add_option("--max", options.text.shown_max, "Show at most N findings as text, errors first; 0: all")
-        ->type_name("N")
-        ->check(CLI::NonNegativeNumber)
-        ->capture_default_str();
-    command.add_flag("-q,--quiet", options.text.quiet, "Show errors only, without a summary, as text");
-    add_colour(command, options.colour);
+    to.add_count("--max", options.text.shown_max, "Show at most N findings as text, errors first; 0: all").called("N");
+    to.add_flag("-q,--quiet", options.text.quiet, "Show errors only, without a summary, as text");
+    add_colour(to, options.colour);
 }
 
-void add_project_rules(CLI::App &command, finding_options &options) {
+void add_project_rules(command &to, finding_options &options) {
     auto set_count = [&options](bool count) { return [&options, count] { options.warnings_count = count; }; };
-    CLI::Option *werror = command.add_flag_callback("--werror", set_count(true), "Count warnings as errors");
-    command
-        .add_flag_callback("--no-werror", set_count(false),
-                           "Do not count warnings as errors, even if cdef.toml says so")
-        ->excludes(werror);
-    add_project_options(command, options.project);
+    option werror = to.add_flag("--werror", set_count(true), "Count warnings as errors");
+    to.add_flag("--no-werror", set_count(false), "Do not count warnings as errors, even if cdef.toml says so")
+        .excludes(werror);
+    add_project_options(to, options.project);
 }
 
-void add_finding_options(CLI::App &command, finding_options &options) {
-    add_report_options(command, options);
-    command.add_option("--warn", options.wanted, "Turn on warning NAME ('cdef explain' lists names and codes), or all")
-        ->type_name("NAME")
-        ->allow_extra_args(false)
-        ->check(CLI::IsMember(warning_names()).description(""));
-    command.add_option("--no-warn", options.unwanted, "Turn off warning NAME, or all")
-        ->type_name("NAME")
-        ->allow_extra_args(false)
-        ->check(CLI::IsMember(warning_names()).description(""));
-    add_project_rules(command, options);
+void add_finding_options(command &to, finding_options &options) {
+    add_report_options(to, options);
+    std::vector<std::string> names = warning_names();
+    to.add("--warn", options.wanted, "Turn on warning NAME ('cdef explain' lists names and codes), or all")
+        .called("NAME")
+        .one_value_each()
+        .one_of_unlisted(names);
+    to.add("--no-warn", options.unwanted, "Turn off warning NAME, or all")
+        .called("NAME")
+        .one_value_each()
+        .one_of_unlisted(names);
+    add_project_rules(to, options);
 }
 
 void require_source(const std::string &path) {

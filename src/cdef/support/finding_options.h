@@ -2,6 +2,7 @@
 #ifndef CDGEN_CDEF_FINDING_OPTIONS_H
 #define CDGEN_CDEF_FINDING_OPTIONS_H
 
+#include "cdef/support/command.h"
 #include "cdef/support/project_files.h"
 #include "check/check.h"
 #include "report/report.h"
@@ -10,10 +11,6 @@
 #include <optional>
 #include <string>
 #include <vector>
-
-namespace CLI {
-class App;
-}
 
 namespace cdef {
 
@@ -48,12 +45,12 @@ struct finding_options {
 };
 
 /* Adds --format, --max, --quiet and --color, which say how findings are shown; */
-void add_report_options(CLI::App &command, finding_options &options);
+void add_report_options(command &to, finding_options &options);
 /* and --werror, --no-werror, --config and --no-config. */
-void add_project_rules(CLI::App &command, finding_options &options);
+void add_project_rules(command &to, finding_options &options);
 
 /* Adds all of these, and --warn and --no-warn. The options must outlive the command. */
-void add_finding_options(CLI::App &command, finding_options &options);
+void add_finding_options(command &to, finding_options &options);
 
 /* Throws check::cannot_check for a database, and names the subcommand that checks it. */
 void require_source(const std::string &path);

@@ -4,17 +4,14 @@
 
 #include "cdef/support/failure.h"
 
-#include <CLI/CLI.hpp>
-
 #include <filesystem>
 #include <utility>
 
 namespace cdef {
 
-void add_project_options(CLI::App &command, project_options &options) {
-    CLI::Option *file = command.add_option("--config", options.file, "Read FILE instead of the nearest cdef.toml");
-    file->type_name("FILE");
-    command.add_flag("--no-config", options.none, "Read no cdef.toml")->excludes(file);
+void add_project_options(command &to, project_options &options) {
+    option file = to.add("--config", options.file, "Read FILE instead of the nearest cdef.toml").called("FILE");
+    to.add_flag("--no-config", options.none, "Read no cdef.toml").excludes(file);
 }
 
 const std::string &project_files::path_for(const std::string &source) {

@@ -3,15 +3,12 @@
 #ifndef CDGEN_CDEF_PROJECT_FILES_H
 #define CDGEN_CDEF_PROJECT_FILES_H
 
+#include "cdef/support/command.h"
 #include "config/config.h"
 
 #include <map>
 #include <optional>
 #include <string>
-
-namespace CLI {
-class App;
-}
 
 namespace cdef {
 
@@ -21,7 +18,7 @@ struct project_options {
 };
 
 /* Adds --config and --no-config. The options must outlive the command. */
-void add_project_options(CLI::App &command, project_options &options);
+void add_project_options(command &to, project_options &options);
 
 /* Reads each project file once. */
 class project_files {

@@ -1,14 +1,13 @@
 /* verify.cpp: the subcommand that checks whether databases are sound. */
 
 #include "cdef/cdef.h"
+#include "cdef/support/command.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/forms.h"
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
 #include "cdef/verify/findings.h"
 #include "cdef/verify/forms.h"
-
-#include <CLI/CLI.hpp>
 
 #include <algorithm>
 #include <memory>
@@ -94,17 +93,15 @@ int run(const verify_options &options) {
 
 } // namespace
 
-void add_verify(CLI::App &app, int &status) {
+void add_verify(program &app) {
     auto options = std::make_shared<verify_options>();
-    CLI::App *command = app.add_subcommand(
-        "verify", "Checks whether databases are sound; prints nothing if there is nothing to report");
-    command->add_option("FILE", options->files, "Database to verify; - is standard input")->required();
-    add_forms(*command, options->form, {"text", "json", "sarif", "github", "gitlab"}, "Form of the findings");
-    command->add_flag("--all", options->shows_all, "Show the findings that follow from others too");
-    command->add_flag("--werror", options->warnings_count, "Count warnings as errors");
-    command->add_flag("-q,--quiet", options->quiet, "Show errors only");
-    command->footer(status_help("verify"));
-    command->callback([options, &status] { status = run(*options); });
+    command made = app.add("verify", "Checks whether databases are sound; prints nothing if there is nothing to report",
+                           [options] { return run(*options); });
+    made.add("FILE", options->files, "Database to verify; - is standard input").required();
+    add_forms(made, options->form, {"text", "json", "sarif", "github", "gitlab"}, "Form of the findings");
+    made.add_flag("--all", options->shows_all, "Show the findings that follow from others too");
+    made.add_flag("--werror", options->warnings_count, "Count warnings as errors");
+    made.add_flag("-q,--quiet", options->quiet, "Show errors only");
 }
 
 } // namespace cdef

@@ -4,8 +4,9 @@
 
 #include "cdef/support/failure.h"
 #include "cdef/support/output.h"
-#include "cdef/support/replace.h"
+#include "cdef/support/replacement.h"
 #include "cdef/support/shown_diff.h"
+#include "cdef/support/text_of_file.h"
 #include "check/fix.h"
 #include "text/shown.h"
 
@@ -44,7 +45,7 @@ std::string fix_source(const std::string &source, const check::warning_set &want
         else if (source == "-")
             print(fixed.text);
         else if (fixed.text != before)
-            replace_file(source, before, fixed.text);
+            replace_file(source, fixed.text, {.sync = true, .before = before});
         say_what_was_done(source, fixed, dry_run);
         return dry_run ? before : fixed.text;
     } catch (const failure &reason) {

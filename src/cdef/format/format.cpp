@@ -7,9 +7,10 @@
 #include "cdef/support/failure.h"
 #include "cdef/support/finding_options.h"
 #include "cdef/support/output.h"
-#include "cdef/support/replace.h"
+#include "cdef/support/replacement.h"
 #include "cdef/support/shown_diff.h"
 #include "cdef/support/status.h"
+#include "cdef/support/text_of_file.h"
 #include "report/report.h"
 #include "text/shown.h"
 
@@ -48,7 +49,7 @@ bool write(const std::string &source, const std::string &before, const std::stri
     else if (!options.in_place || source == "-")
         print(after);
     else if (!same)
-        replace_file(source, before, after);
+        replace_file(source, after, {.sync = true, .before = before});
     return same || (!options.checks && !options.diffs);
 }
 

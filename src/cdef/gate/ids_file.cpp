@@ -3,8 +3,8 @@
 #include "cdef/gate/ids_file.h"
 
 #include "cdef/support/failure.h"
-#include "cdef/support/replace.h"
 #include "cdef/support/replacement.h"
+#include "cdef/support/text_of_file.h"
 
 #include <filesystem>
 #include <utility>
@@ -27,7 +27,7 @@ ids_file::ids_file(std::string name, bool may_be_missing) : path(std::move(name)
 
 void ids_file::save() const {
     if (std::string now = recorded.text(); now != before)
-        replace_file(path, now);
+        replace_file(path, now, {.before = is_there ? std::optional<std::string_view>(before) : std::nullopt});
 }
 
 } // namespace cdef::gate_command

@@ -3,7 +3,7 @@
 #include "cdef/lsp/files.h"
 
 #include "cdef/support/failure.h"
-#include "cdef/support/replace.h"
+#include "cdef/support/text_of_file.h"
 #include "report/places.h"
 
 #include <algorithm>

@@ -4,6 +4,7 @@
 
 #include "cdef/support/failure.h"
 #include "cdef/support/interruption.h"
+#include "cdef/support/text_of_file.h"
 #include "text/hex.h"
 
 #include <array>
@@ -160,15 +161,17 @@ private:
     bool is_mine() const {
         return has_name(file.get(), name);
     }
-    /* Sets the owner first, because changing it may clear bits of the mode. Not every user may change it. */
+    /* Sets the owner first, because changing it may clear bits of the mode. Not every user may change it; then nobody
+     * gets the rights of the new owner. */
     void adopt(const struct stat &old) const {
-        constexpr mode_t MODE = 07777;
+        constexpr mode_t MODE = 07777, OWNERS_RIGHTS = S_ISUID | S_ISGID;
         struct stat mine = {};
         require(fstat(file.get(), &mine) == 0);
         bool other = mine.st_uid != old.st_uid || mine.st_gid != old.st_gid;
-        if (other && fchown(file.get(), old.st_uid, old.st_gid) != 0) [[maybe_unused]]
+        bool differs = other && fchown(file.get(), old.st_uid, old.st_gid) != 0;
+        if (differs) [[maybe_unused]]
             int group_at_least = fchown(file.get(), static_cast<uid_t>(-1), old.st_gid);
-        require(fchmod(file.get(), old.st_mode & MODE) == 0);
+        require(fchmod(file.get(), old.st_mode & (differs ? MODE & ~OWNERS_RIGHTS : MODE)) == 0);
     }
 
     std::string name;
@@ -196,25 +199,35 @@ void sync_directory(const std::string &target) {
     require(directory.is_open() && fsync(directory.get()) == 0);
 }
 
+/* Refuses a file that this user may not write to, even if the directory would allow to replace it, and one with other
+ * contents. */
+void require_contents(const std::string &target, std::string_view contents) {
+    require(access(target.c_str(), W_OK) == 0);
+    if (text_of_file(target) != contents)
+        throw failure("it has been changed in the meantime");
+}
+
 /* False if there is a temporary file already. */
-bool replaced_at_once(const std::string &target, std::string_view contents, bool sync) {
+bool replaced_at_once(const std::string &target, std::string_view contents, const replacement_options &options) {
     uninterrupted work;
     std::optional<struct stat> old = existing(target);
     temporary_file temporary(temporary_of(target), old ? PRIVATE_MODE : NEW_MODE);
     if (!temporary.is_made())
         return false;
-    temporary.fill(contents, old, sync);
+    temporary.fill(contents, old, options.sync);
+    if (options.before)
+        require_contents(target, *options.before);
     temporary.rename_to(target);
     return true;
 }
 
-void replace_target(const std::string &target, std::string_view contents, bool sync) {
-    for (int tries = 0; !replaced_at_once(target, contents, sync); ++tries) {
+void replace_target(const std::string &target, std::string_view contents, const replacement_options &options) {
+    for (int tries = 0; !replaced_at_once(target, contents, options); ++tries) {
         if (tries == MOST_TRIES)
             throw step_failed{EEXIST};
         clear_away(temporary_of(target), true);
     }
-    if (sync)
+    if (options.sync)
         sync_directory(target);
 }
 
@@ -262,7 +275,7 @@ void remove_remains(const std::string &target) {
 void replace_file(const std::string &path, std::string_view contents, const replacement_options &options) {
     std::string target = target_of(path);
     try {
-        replace_target(target, contents, options.sync);
+        replace_target(target, contents, options);
     } catch (const step_failed &step) {
         throw failure(path + ": cannot write: " + std::strerror(step.error));
     } catch (const failure &e) {

@@ -4,6 +4,7 @@
 #ifndef CDGEN_CDEF_REPLACEMENT_H
 #define CDGEN_CDEF_REPLACEMENT_H
 
+#include <optional>
 #include <string>
 #include <string_view>
 
@@ -22,6 +23,9 @@ void remove_remains(const std::string &target);
 
 struct replacement_options {
     bool sync = false; /* contents and name are on the disk before the function returns */
+    /* What a program has read from the file and changed. If the file has other contents by now, or may not be written
+     * to, it is not replaced. */
+    std::optional<std::string_view> before = {};
 };
 
 /* Replaces the file that a path leads to, or makes it. It keeps its mode and, if this user may give files away, its

@@ -132,6 +132,14 @@ def test_what_is_not_a_file(directory):
     assert status == 2 and ".: Is a directory" in errors
 
 
+def test_temporary_file_of_a_killed_program(source):
+    """The next correction removes it."""
+    (source.parent / ".x.cdefsrc.cdef-new").write_bytes(SOUND[:20])
+    check("--fix", source.name, cwd=source.parent)
+    same(source.read_bytes(), SOUND, "source")
+    alone(source)
+
+
 def test_full_disk(source):
     """The old file stays if the new one cannot be written."""
     limit = max(len(SOUND) // 2, 1)

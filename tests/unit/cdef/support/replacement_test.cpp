@@ -50,9 +50,9 @@ protected:
     size_t files() const {
         return static_cast<size_t>(std::distance(fs::directory_iterator(here), fs::directory_iterator()));
     }
-    std::string refusal(const std::string &name) const {
+    std::string refusal(const std::string &name, const cdef::replacement_options &options = {}) const {
         try {
-            replace_file(path(name), "new");
+            replace_file(path(name), "new", options);
         } catch (const cdef::failure &e) {
             return std::string(e.what()).substr(here.string().size() + 1);
         }
@@ -111,6 +111,29 @@ TEST_F(Replacement, RefusesWhatIsNoFile) {
     EXPECT_EQ(refusal("pipe"), "pipe: cannot write: not a regular file");
     EXPECT_EQ(refusal("nowhere/a.cdef"), "nowhere/a.cdef: cannot write: No such file or directory");
     EXPECT_EQ(files(), 3u);
+}
+
+TEST_F(Replacement, ReplacesAFileThatHasNotChanged) {
+    write("a.cdefsrc", "old");
+    replace_file(path("a.cdefsrc"), "new", {.before = "old"});
+    EXPECT_EQ(read("a.cdefsrc"), "new");
+}
+
+TEST_F(Replacement, LeavesAFileThatHasChangedInTheMeantime) {
+    write("a.cdefsrc", "old");
+    EXPECT_EQ(refusal("a.cdefsrc", {.before = "older"}),
+              "a.cdefsrc: cannot write: it has been changed in the meantime");
+    EXPECT_EQ(read("a.cdefsrc"), "old");
+    EXPECT_EQ(files(), 1u);
+}
+
+TEST_F(Replacement, ReplacesOnlyAFileThatWasRead) {
+    fs::create_directory(here / "d");
+    EXPECT_EQ(refusal("d", {.before = ""}), "d: cannot write: Is a directory");
+    EXPECT_EQ(refusal("none", {.before = ""}), "none: cannot write: No such file or directory");
+    EXPECT_EQ(refusal("d/none/a", {.before = ""}), "d/none/a: cannot write: No such file or directory");
+    EXPECT_THROW(replace_file("/dev/null", "new", {.before = ""}), cdef::failure);
+    EXPECT_EQ(files(), 1u);
 }
 
 TEST_F(Replacement, NamesTheTemporaryFileAfterItsTarget) {

@@ -77,7 +77,6 @@ public:
     }
 
     void write() {
-        out.blank_line();
         out.stanza("ResourceClass", from.place);
         write_lines(*this, lines_of(SC_RESOURCE_CLASS));
     }
@@ -136,7 +135,6 @@ struct plain_stanza_writer {
     }
 
     void write(stanza_id stanza) {
-        out.blank_line();
         out.stanza(sc_tables[stanza].sc_name, from.place);
         write_lines(*this, lines_of(stanza));
     }
@@ -189,7 +187,6 @@ public:
           db(database) {}
 
     void write() {
-        out.blank_line();
         out.stanza("ClassToManagerMapping", from.place);
         write_lines(*this, lines_of(SC_CLASS_TO_MANAGER_MAPPING));
     }

@@ -51,7 +51,6 @@ public:
         std::span<const stanza_line> lines = lines_of(stanza_of(at.from));
         auto required = static_cast<std::size_t>(
             std::count_if(lines.begin(), lines.end(), [](const stanza_line &l) { return l.is_required(); }));
-        out.blank_line();
         out.stanza(side_table_of(at.from).stanza, from.place);
         write_lines(*this, lines.first(required));
         require_type_and_varieties();
@@ -197,7 +196,6 @@ public:
           in(of), action(written) {}
 
     void write() {
-        out.blank_line();
         out.stanza(side_table_of(in).stanza, from.place);
         write_lines(*this, lines_of(stanza_of(in)));
         write_runs();
@@ -253,7 +251,6 @@ void write_step(source_writer &out, const class_plan &plan, const step &s) {
     case table::actions:
         return write_action(out, plan, s);
     case table::inputs:
-        out.blank_line();
         return write_run(out, class_inputs[s.index].stanza(), plan.view.sd_input(class_inputs[s.index].reference),
                          place_of("ResourceClass", plan.view.name()));
     }

@@ -16,12 +16,8 @@ void source_writer::comment(std::string_view lines) {
     }
 }
 
-void source_writer::blank_line() {
-    text += "\n";
-}
-
 void source_writer::stanza(std::string_view kind, const record_name &place) {
-    text.append(kind) += '\n';
+    text.append("\n").append(kind).append("\n");
     current = place;
 }
 

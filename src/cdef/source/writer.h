@@ -17,8 +17,7 @@ class source_writer {
 public:
     /* Writes each line of the text as a comment. Lines are not wrapped, so they must be short. */
     void comment(std::string_view text);
-    void blank_line();
-    /* place: named in messages about its lines. */
+    /* Begins a stanza, after an empty line as `cdef format` puts it. place: named in messages about its lines. */
     void stanza(std::string_view kind, const record_name &place);
     void line(std::string_view name, std::string_view value);
     void line(std::string_view name, std::int64_t number);

@@ -7,8 +7,8 @@ that is expected, or as stderr: the message of one that is refused.
 
 Besides, whatever compiles must come back: the source of a database compiles to
 one that cdef diff calls identical, and the source of that one is the same
-source.  That holds for every golden source, the twins, the examples, and for
-generated sources, in both byte orders.
+source.  cdef format leaves it as it is.  That holds for every golden source,
+the twins, the examples, and for generated sources, in both byte orders.
 """
 
 import os
@@ -82,6 +82,9 @@ def round_trip(programs, source, out="out.cdef", swap=False):
         difference = programs.run(directory, programs.cdef, "diff", "first", out)
         if difference.returncode != 0:
             problems.append(f"differs: {(difference.stdout + difference.stderr).decode()}")
+        tidy = programs.run(directory, programs.cdef, "format", "--check", SOURCE)
+        if tidy.returncode != 0:
+            problems.append(f"cdef format changes it: {(tidy.stdout + tidy.stderr).decode()}")
         again = programs.source(directory, second)
         if again.stdout != written.stdout:
             problems.append(f"another source the second time: {again.stderr.decode()}")

@@ -15,9 +15,9 @@ TEST(SourceWriter, WritesStanzasAndLines) {
     out.stanza("ResourceClass", place_of("ResourceClass", "C"));
     out.line("Description", 5);
     out.optional_line("GroupID", 255, 255);
-    out.blank_line();
+    out.stanza("ControlDefinition", place_of("ResourceClass", "C"));
     out.comment("a\nb");
-    EXPECT_EQ(out.text, "ResourceClass\n\tDescription=5\n\n# a\n# b\n");
+    EXPECT_EQ(out.text, "\nResourceClass\n\tDescription=5\n\nControlDefinition\n# a\n# b\n");
 }
 
 TEST(SourceWriter, TakesTheFirstTextThatFits) {

@@ -34,18 +34,19 @@ def environment(place):
 
 
 class Neovim:
-    """One that runs without a screen, and is typed into."""
+    """One that runs without a screen, in the home, and is typed into."""
 
     def __init__(self, place):
         self.place = place
+        self.home = place / "home"
         configuration = PROJECT / "editors/neovim/cdef.lua"
         self.process = subprocess.Popen(
-            ["nvim", "--headless", "--clean", "--listen", "socket", "-c", f"luafile {configuration}", "-c", "edit pump.cdefsrc"],
-            cwd=place, env=environment(place), stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL, stderr=subprocess.STDOUT)
+            ["nvim", "--headless", "--clean", "--listen", "socket", "-c", f"luafile {configuration}", "-c", "edit ../pump.cdefsrc"],
+            cwd=self.home, env=environment(place), stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL, stderr=subprocess.STDOUT)
 
     def remote(self, *words):
         """What another Neovim makes this one do. An early version prints values to standard error."""
-        done = subprocess.run(["nvim", "--server", "socket", *words], cwd=self.place, env=environment(self.place),
+        done = subprocess.run(["nvim", "--server", "socket", *words], cwd=self.home, env=environment(self.place),
                               stdin=subprocess.DEVNULL, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, text=True,
                               timeout=WAIT, check=False)
         return done.stdout
@@ -67,6 +68,7 @@ def test_neovim(place):
     """Version 0.7 or later, by its keys and commands."""
     nvim = Neovim(place)
     try:
+        nvim.expect("luaeval('(vim.lsp.get_active_clients()[1] or { config = {} }).config.root_dir')", str(place))
         nvim.expect("luaeval('(vim.diagnostic.get(0)[1] or { message = \"\" }).message')", MESSAGE)
         nvim.type("4Gf=DA<C-x><C-o>")
         nvim.expect("trim(getline(4))", "Description=")

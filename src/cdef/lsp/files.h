@@ -13,7 +13,7 @@ namespace cdef {
 std::optional<std::string> bytes_of_file(const std::string &path);
 
 /* The sources in a folder and in the folders below it, in order. Links to folders are not followed, and hidden folders
- * are left out. */
+ * are left out. The search ends early in a folder with very many files, such as the root of a file system. */
 std::vector<std::string> sources_below(const std::string &folder);
 
 /* The page with the explanations of all codes, as a URI: where it is installed beside the program, or empty. */

@@ -37,6 +37,10 @@ std::string place_of(const std::string &source, const mention &at) {
     return source + (line == 0 ? "" : ":" + std::to_string(line));
 }
 
+check::elsewhere in_other(const std::string &source, const mention &at, std::string what) {
+    return {source, {at.at, std::move(what), at.source}};
+}
+
 std::string keys_of(const mapping &map) {
     return std::to_string(map.first) + " to " + std::to_string(map.last);
 }
@@ -68,7 +72,7 @@ class_facts facts_of(const check::view &source, std::span<const std::byte> image
 }
 
 /* Reported once for each source; one report is enough to see that names or keys must change. */
-void class_family::warn(check::warning_id id, const mention &at, std::string text) {
+void class_family::warn(check::warning_id id, const mention &at, std::string text, check::elsewhere other) {
     const check::warning &known = check::warnings[id];
     bool is_told =
         std::any_of(found.begin(), found.end(), [&](const check::finding &f) { return f.code == known.code; });
@@ -81,6 +85,7 @@ void class_family::warn(check::warning_id id, const mention &at, std::string tex
     one.text = std::move(text);
     one.at = at.at;
     one.source = at.source;
+    one.others.push_back(std::move(other));
     found.push_back(std::move(one));
 }
 
@@ -88,7 +93,8 @@ void class_family::look_at_name(const mention &name, const std::string &source) 
     auto [same, is_new] = classes.emplace(name.text, member<mention>{source, name});
     if (!is_new)
         warn(check::SHARED_NAME, name,
-             "the class " + quoted(name.text) + " is also in " + place_of(same->second.source, same->second.fact));
+             "the class " + quoted(name.text) + " is also in " + place_of(same->second.source, same->second.fact),
+             in_other(same->second.source, same->second.fact, "the other class " + quoted(name.text)));
 }
 
 void class_family::look_at_keys(const mapping &map) {
@@ -97,7 +103,8 @@ void class_family::look_at_keys(const mapping &map) {
             return warn(check::SHARED_KEYS, map.first_key,
                         "the keys " + keys_of(map) + " overlap " + keys_of(other.fact) + " in " +
                             place_of(other.source, other.fact.first_key) + ", which has the message catalog " +
-                            quoted(map.catalog) + " too");
+                            quoted(map.catalog) + " too",
+                        in_other(other.source, other.fact.first_key, "the keys " + keys_of(other.fact)));
 }
 
 void class_family::look_at_manager(const mapping &map) {
@@ -106,7 +113,8 @@ void class_family::look_at_manager(const mapping &map) {
             return warn(check::OTHER_MANAGER, map.manager,
                         "classes with the message catalog " + quoted(map.catalog) + " have the manager " +
                             quoted(map.manager.text) + " here and " + quoted(other.fact.manager.text) + " in " +
-                            place_of(other.source, other.fact.manager));
+                            place_of(other.source, other.fact.manager),
+                        in_other(other.source, other.fact.manager, "the manager " + quoted(other.fact.manager.text)));
 }
 
 void class_family::look_at_variables(const variable_class &variables, const std::string &source) {
@@ -117,7 +125,8 @@ void class_family::look_at_variables(const variable_class &variables, const std:
         return;
     warn(check::OTHER_VARIABLE_CLASS, variables.name,
          "the variable class " + quoted(variables.name.text) + " has other intervals or another alias than in " +
-             place_of(same->second.source, other.name));
+             place_of(same->second.source, other.name),
+         in_other(same->second.source, other.name, "the other variable class " + quoted(other.name.text)));
 }
 
 std::vector<check::finding> class_family::add(const std::string &source, const class_facts &facts,

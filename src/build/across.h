@@ -53,7 +53,7 @@ private:
         Fact fact;
     };
 
-    void warn(check::warning_id id, const check::mention &at, std::string text);
+    void warn(check::warning_id id, const check::mention &at, std::string text, check::elsewhere other);
     void look_at_name(const check::mention &name, const std::string &source);
     void look_at_keys(const mapping &map);
     void look_at_manager(const mapping &map);

@@ -116,6 +116,12 @@ struct correction {
     std::vector<edit> edits; /* by place; empty: a program cannot cure the finding */
 };
 
+/* A place in another source that a finding is about too. Its text names what is there. */
+struct elsewhere {
+    std::string file;
+    note what;
+};
+
 struct finding {
     bool error = true;
     const char *code = "";
@@ -125,6 +131,7 @@ struct finding {
     std::string source; /* the line */
     std::vector<note> notes;
     correction fix = {};
+    std::vector<elsewhere> others = {}; /* the text already names these places, too */
 };
 
 struct totals {

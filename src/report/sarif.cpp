@@ -73,12 +73,15 @@ json fix_of(const std::string &file, const check::correction &fix) {
 /* Each once, as consumers want it. */
 json related_locations(const std::string &file, const finding &found) {
     json all = json::array();
-    for (const note &more : found.notes) {
-        json related = location_of(file, more.at, source_of(more, found));
-        related["message"]["text"] = more.text;
+    auto add = [&](json related, const std::string &text) {
+        related["message"]["text"] = text;
         if (std::find(all.begin(), all.end(), related) == all.end())
             all.push_back(std::move(related));
-    }
+    };
+    for (const note &more : found.notes)
+        add(location_of(file, more.at, source_of(more, found)), more.text);
+    for (const check::elsewhere &other : found.others)
+        add(location_of(other.file, other.what.at, other.what.source), other.what.text);
     return all;
 }
 
@@ -89,7 +92,7 @@ json result_of(const std::string &file, const finding &found, const fingerprint 
     entry["level"] = found.error ? "error" : "warning";
     entry["message"]["text"] = found.text;
     entry["locations"].push_back(location_of(file, found.at, found.source));
-    if (!found.notes.empty())
+    if (!found.notes.empty() || !found.others.empty())
         entry["relatedLocations"] = related_locations(file, found);
     entry["partialFingerprints"]["primaryLocationLineHash"] = print.text();
     if (!found.fix.edits.empty())

@@ -91,17 +91,18 @@ std::string title_of(const check::finding &found) {
 /* Every correction that a finding in the range carries. */
 void collector::add_corrections() {
     finding_places places(in.text());
-    const std::vector<check::finding> &findings = in.findings(now.settings.wanted_in(in.uri()));
-    for (const check::finding &each : findings) {
-        stretch at = places.of(each.at);
-        if (each.fix.edits.empty() || at.begin > part.end || at.end < part.begin)
-            continue;
+    std::vector<check::finding> corrected;
+    for (const check::finding &each : in.findings(now.settings.wanted_in(in.uri())))
+        if (stretch at = places.of(each.at); !each.fix.edits.empty() && at.begin <= part.end && at.end >= part.begin)
+            corrected.push_back(each);
+    json shown = json::parse(diagnostics_text(in.text(), in.lines(), in.uri(), corrected, now.form(), {}));
+    for (std::size_t i = 0; i < corrected.size(); ++i) {
         json edits = json::array();
-        for (const check::edit &made : each.fix.edits)
+        for (const check::edit &made : corrected[i].fix.edits)
             edits.push_back(byte_edit(in, now.client.units, places.of(made), made.text));
-        json &action = add(title_of(each), QUICK_FIX, std::move(edits));
-        action["diagnostics"] = json::parse(diagnostics_text(in.text(), in.lines(), in.uri(), {&each, 1}, now.form()));
-        if (each.fix.sure == check::certainty::certain)
+        json &action = add(title_of(corrected[i]), QUICK_FIX, std::move(edits));
+        action["diagnostics"] = json::array({std::move(shown[i])});
+        if (corrected[i].fix.sure == check::certainty::certain)
             action["isPreferred"] = true;
     }
 }

@@ -63,8 +63,9 @@ void append_number(std::string &to, std::size_t number) {
 class list_writer {
 public:
     list_writer(std::string_view text, const line_table &lines, const std::string &called,
-                const diagnostic_form &wanted)
-        : form(wanted), places(text), positions(text, lines, wanted.units), note_positions(text, lines, wanted.units) {
+                const diagnostic_form &wanted, const other_places &elsewhere)
+        : form(wanted), others(elsewhere), places(text), positions(text, lines, wanted.units),
+          note_positions(text, lines, wanted.units) {
         report::append_json(uri, called);
     }
 
@@ -82,8 +83,8 @@ public:
             report::append_json(made, link_to(form.explanations, found.code));
             made += "}";
         }
-        if (form.relates && !found.notes.empty())
-            add_notes(found);
+        if (form.relates && !(found.notes.empty() && found.others.empty()))
+            add_related(found);
         made += "}";
     }
     std::string take() {
@@ -111,22 +112,29 @@ private:
         add_position("end", of.end);
         made += "}";
     }
-    void add_notes(const check::finding &found) {
+    void add_related(const check::finding &found) {
         made += R"(,"relatedInformation":[)";
-        for (const check::note &more : found.notes) {
-            made.append(&more == found.notes.data() ? "" : ",")
-                .append(R"({"location":{"uri":)")
-                .append(uri)
-                .append(",");
-            add_range(note_positions.of(places.of(more.at.line == 0 ? found.at : more.at)));
-            made += R"(},"message":)";
-            report::append_json(made, more.text);
-            made += "}";
+        for (const check::note &more : found.notes)
+            add_place(uri, note_positions.of(places.of(more.at.line == 0 ? found.at : more.at)), more.text);
+        for (const check::elsewhere &other : found.others) {
+            const location place = others(other);
+            std::string other_uri;
+            report::append_json(other_uri, place.uri);
+            add_place(other_uri, place.at, other.what.text);
         }
-        made += "]";
+        made.back() = ']';
+    }
+    /* With a comma after it. */
+    void add_place(const std::string &uri_as_json, const range &at, std::string_view message) {
+        made.append(R"({"location":{"uri":)").append(uri_as_json).append(",");
+        add_range(at);
+        made += R"(},"message":)";
+        report::append_json(made, message);
+        made += "},";
     }
 
     const diagnostic_form &form;
+    const other_places &others;
     std::string uri; /* as JSON */
     finding_places places;
     position_maker positions;
@@ -137,10 +145,11 @@ private:
 } // namespace
 
 std::string diagnostics_text(std::string_view text, const line_table &lines, const std::string &uri,
-                             std::span<const check::finding> findings, const diagnostic_form &form) {
+                             std::span<const check::finding> findings, const diagnostic_form &form,
+                             const other_places &others) {
     if (findings.empty())
         return "[]";
-    list_writer list(text, lines, uri, form);
+    list_writer list(text, lines, uri, form, others);
     for (const check::finding &each : findings)
         list.add(each);
     return list.take();

@@ -5,6 +5,7 @@
 #include "check/check.h"
 #include "server/positions.h"
 
+#include <functional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -36,9 +37,17 @@ private:
     std::vector<std::size_t> begins; /* of the lines that end with a newline, as findings count them */
 };
 
-/* The list of diagnostics of a document, as JSON. */
+/* A place in another document. */
+struct location {
+    std::string uri;
+    range at;
+};
+using other_places = std::function<location(const check::elsewhere &)>;
+
+/* The list of diagnostics of a document, as JSON. others: where the places in other documents are. */
 std::string diagnostics_text(std::string_view text, const line_table &lines, const std::string &uri,
-                             std::span<const check::finding> findings, const diagnostic_form &form);
+                             std::span<const check::finding> findings, const diagnostic_form &form,
+                             const other_places &others);
 
 } // namespace lsp
 

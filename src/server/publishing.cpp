@@ -12,12 +12,26 @@ namespace lsp {
 
 namespace {
 
+location location_in(const document &other, const check::place &at, encoding units) {
+    return {other.uri(), other.positions(units).of(finding_places(other.text()).of(at))};
+}
+
+/* A place in a source that another one contradicts, as it is in the editor or on the disk. */
+location location_elsewhere(const session &now, const check::elsewhere &other) {
+    auto open = now.open.find(other.file);
+    if (open != now.open.end())
+        return location_in(open->second, other.what.at, now.client.units);
+    document stored(report::uri_of(other.file), 0, now.world.read(other.file).value_or(""));
+    return location_in(stored, other.what.at, now.client.units);
+}
+
 /* The findings of a text, those of its own before those that other classes cause. */
 std::string diagnostics_in(session &now, const std::string &uri, const document &in,
                            std::vector<check::finding> findings) {
     std::vector<check::finding> across = now.sources.across(key_of(uri));
     findings.insert(findings.end(), across.begin(), across.end());
-    return diagnostics_text(in.text(), in.lines(), uri, findings, now.form());
+    auto elsewhere = [&](const check::elsewhere &other) { return location_elsewhere(now, other); };
+    return diagnostics_text(in.text(), in.lines(), uri, findings, now.form(), elsewhere);
 }
 
 /* A line counts from 0, or is the first one; a column counts characters. */

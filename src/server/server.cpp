@@ -175,7 +175,6 @@ void server::finish_step() {
     }
 }
 
-/* A response answers a request of the server, none of which needs its answer. */
 void server::handle(const waiting_message &waited) {
     const json &message = waited.content;
     const json *id = optional_member(message, "id");
@@ -183,6 +182,8 @@ void server::handle(const waiting_message &waited) {
         bool is_response = message.contains("result") || message.contains("error");
         if (!is_response)
             refuse(id != nullptr && is_id(*id) ? *id : json(), INVALID_REQUEST, "the message has no method");
+        else if (id != nullptr && id->is_string())
+            now.sources.take_answer(now, id->get<std::string>(), message.contains("result"));
     } else if (message.contains("id") && (id == nullptr || !is_id(*id)))
         refuse(nullptr, INVALID_REQUEST, "an id is a text or a number");
     else if (id != nullptr)

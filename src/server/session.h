@@ -67,9 +67,11 @@ struct session {
     void send(const json &message) {
         outbox.push_back(written(message));
     }
-    /* Sends a request of the server, whose answer does not matter. */
-    void ask(std::string_view method, json params) {
-        send(request("cdef/" + std::to_string(++asked), method, std::move(params)));
+    /* Sends a request of the server. Returns its identifier. */
+    std::string ask(std::string_view method, json params) {
+        std::string id = "cdef/" + std::to_string(++asked);
+        send(request(id, method, std::move(params)));
+        return id;
     }
     /* The open document that the parameters of a request name. Throws request_error. */
     document &document_in(const json &params);

@@ -8,6 +8,8 @@
 #include "server/session.h"
 
 #include <algorithm>
+#include <string_view>
+#include <tuple>
 #include <utility>
 
 namespace lsp {
@@ -20,9 +22,17 @@ std::string with_slash(const std::string &path) {
     return path.ends_with('/') ? path : path + "/";
 }
 
+/* File, line and column. */
+std::vector<std::tuple<std::string_view, int, std::size_t>> places_elsewhere(const check::finding &found) {
+    std::vector<std::tuple<std::string_view, int, std::size_t>> places;
+    for (const check::elsewhere &other : found.others)
+        places.emplace_back(other.file, other.what.at.file_line, other.what.at.column);
+    return places;
+}
+
 bool is_same(const check::finding &a, const check::finding &b) {
     return std::string_view(a.code) == b.code && a.text == b.text && a.at.file_line == b.at.file_line &&
-           a.at.column == b.at.column;
+           a.at.column == b.at.column && places_elsewhere(a) == places_elsewhere(b);
 }
 
 } // namespace
@@ -38,7 +48,7 @@ void workspace::add_folder(session &now, const std::string &path) {
         known.try_emplace(each);
         waiting.insert(each);
     }
-    begin_progress(now);
+    ask_for_progress(now);
 }
 
 void workspace::remove_folder(session &now, const std::string &path) {
@@ -108,14 +118,24 @@ void workspace::compare(session &now) {
     }
 }
 
-void workspace::begin_progress(session &now) {
+void workspace::ask_for_progress(session &now) {
     scan_size = waiting.size();
-    if (in_progress || !now.client.shows_progress || scan_size == 0)
+    if (!in_progress && progress_request.empty() && now.client.shows_progress && scan_size > 0)
+        progress_request = now.ask("window/workDoneProgress/create", {{"token", PROGRESS}});
+}
+
+/* The sources may all have been looked at already: then the progress ends at once. */
+void workspace::take_answer(session &now, const std::string &id, bool agreed) {
+    if (id != progress_request)
+        return;
+    progress_request.clear();
+    if (!agreed)
         return;
     in_progress = true;
-    now.ask("window/workDoneProgress/create", {{"token", PROGRESS}});
     json value = {{"kind", "begin"}, {"title", "Checking sources"}, {"cancellable", true}, {"percentage", 0}};
     now.send(notification("$/progress", {{"token", PROGRESS}, {"value", std::move(value)}}));
+    if (waiting.empty())
+        report_progress(now);
 }
 
 void workspace::report_progress(session &now) {

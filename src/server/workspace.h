@@ -59,16 +59,20 @@ public:
     /* The client does not want to wait for the rest of the first look. */
     void stop_scan(session &now);
 
+    /* The client has answered a request. Progress is only reported after it has agreed to show it. */
+    void take_answer(session &now, const std::string &id, bool agreed);
+
 private:
     void check(session &now, const std::string &path);
     void compare(session &now);
-    void begin_progress(session &now);
+    void ask_for_progress(session &now);
     void report_progress(session &now);
 
     std::set<std::string> folders; /* each with a slash at its end */
     std::map<std::string, workspace_file> known;
     std::set<std::string> waiting; /* sources to be looked at */
     bool uncompared = false;       /* facts have changed since the classes were compared */
+    std::string progress_request;  /* asks whether the client shows progress; empty: answered, or not asked */
     bool in_progress = false;      /* the client has been told of a first look that has not ended */
     std::size_t scan_size = 0;     /* sources of the first look */
 };

@@ -254,6 +254,16 @@ def test_warns_of_classes_that_contradict_each_other(world):
         expect(world.inspect("check", "--werror", source), 0)
 
 
+def test_sarif_has_the_place_of_the_other_class(world):
+    world.write("a.cdefsrc", HEAD)
+    world.write("b.cdefsrc", HEAD.replace(b"Name=Disk", b"Name=Tape"))
+    (result,) = json.loads(build(world, "--format=sarif", "a.cdefsrc", "b.cdefsrc").stdout)["runs"][0]["results"]
+    (other,) = result["relatedLocations"]
+    check(other["message"]["text"] == "the keys 1 to 100", other)
+    check(other["physicalLocation"]["artifactLocation"]["uri"] == "a.cdefsrc", other)
+    check(other["physicalLocation"]["region"] == {"startLine": 12, "startColumn": 11, "endColumn": 12}, other)
+
+
 def test_shows_how_far_it_is_on_a_terminal_only(world):
     """And clears the line in the end; a terminal that cannot is left alone."""
     sources(world, "a.cdefsrc", "b.cdefsrc")

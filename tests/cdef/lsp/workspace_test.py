@@ -59,6 +59,38 @@ def test_all_sources_are_checked_and_compared(folder):
         assert uri_of(folder / ".hidden/c.cdefsrc") not in client.published
 
 
+def related(client, path):
+    """Where else the only finding of a file points to."""
+    (found,) = client.published[uri_of(path)]["diagnostics"]
+    return [(each["location"]["uri"], each["location"]["range"], each["message"]) for each in found["relatedInformation"]]
+
+
+def test_findings_across_classes_show_the_other_class(folder):
+    """Its place is that in the editor if it is open there; columns are those of the protocol."""
+    a, b = folder / "a.cdefsrc", folder / "deep/b.cdefsrc"
+    header = PUMP.split("\n").index("ResourceClass")
+    with Client(root=folder) as client:
+        wait_for(client, b, ["S611"])
+        start, end = {"line": header, "character": 0}, {"line": header, "character": len("ResourceClass")}
+        assert related(client, b) == [(uri_of(a), {"start": start, "end": end}, "the other class `Pump`")]
+        client.open(uri_of(a), "# \u03b1\n" + PUMP)
+        start, end = ({**each, "line": header + 1} for each in (start, end))
+        while related(client, b)[0][1] != {"start": start, "end": end}:
+            client.next()
+
+
+def test_related_columns_of_other_classes_count_code_units(folder):
+    a, b = folder / "a.cdefsrc", folder / "b.cdefsrc"
+    a.write_text(PUMP.replace("ResourceManager=M", 'ResourceManager="\u03b1\U0001d50a"'))
+    b.write_text(PUMP.replace("Name=Pump", "Name=Fan").replace("FirstKey=1", "FirstKey=3").replace("LastKey=2", "LastKey=4"))
+    (folder / "deep/b.cdefsrc").unlink()
+    with Client(root=folder) as client:
+        wait_for(client, b, ["S613"])
+        (uri, place, message), = related(client, b)
+        assert (uri, part(a.read_text(), place), message) == (
+            uri_of(a), "\u03b1\U0001d50a", "the manager `\u03b1\U0001d50a`")
+
+
 def test_open_document_counts_in_the_place_of_its_file(folder):
     path = folder / "deep/b.cdefsrc"
     with Client(root=folder) as client:

@@ -34,19 +34,26 @@ protected:
         check::check_bytes(
             text, name, {}, [](check::finding &&) {}, &job);
         codes all;
-        for (const check::finding &each : family.add(name, facts, wanted))
+        others.clear();
+        for (const check::finding &each : family.add(name, facts, wanted)) {
             all.push_back(found_in::shown(each) + " " + each.text);
+            for (const check::elsewhere &other : each.others)
+                others.push_back(other.file + ":" + std::to_string(other.what.at.file_line) + ":" +
+                                 std::to_string(other.what.at.column) + " " + other.what.text);
+        }
         return all;
     }
 
     check::warning_set wanted = found_in::all_warnings();
     build::class_family family;
+    codes others; /* the places in other sources that the latest warnings name */
 };
 
 TEST_F(Across, ReportsAClassOfTheSameName) {
     std::string other = changed("MessageCatalog=m", "MessageCatalog=n");
     EXPECT_EQ(add("a", found_in::CLASS), codes());
     EXPECT_EQ(add("b", other), codes{"S611 3 the class `Pump` is also in a:3"});
+    EXPECT_EQ(others, codes{"a:3:0 the other class `Pump`"});
     EXPECT_EQ(add("c", changed("Name=Pump", "Name=pump", changed("MessageCatalog=m", "MessageCatalog=o"))), codes());
 }
 
@@ -57,6 +64,7 @@ TEST_F(Across, ReportsKeysThatOverlapInOneCatalog) {
     std::string third = changed("Name=Pump", "Name=Lamp");
     EXPECT_EQ(add("c", changed("FirstKey=1\n\tLastKey=2", "FirstKey=9\n\tLastKey=12", third)),
               codes{"S612 12:11+1 the keys 9 to 12 overlap 3 to 9 in b:12, which has the message catalog `m` too"});
+    EXPECT_EQ(others, codes{"b:12:11 the keys 3 to 9"});
     std::string fourth = changed("Name=Pump", "Name=Door");
     EXPECT_EQ(add("d", changed("MessageCatalog=m", "MessageCatalog=n", fourth)), codes());
 }
@@ -66,6 +74,7 @@ TEST_F(Across, ReportsAnotherManagerOfOneCatalog) {
     EXPECT_EQ(add("a", found_in::CLASS), codes());
     EXPECT_EQ(add("b", changed("ResourceManager=M", "ResourceManager=N", other)),
               codes{"S613 11:18+1 classes with the message catalog `m` have the manager `N` here and `M` in a:11"});
+    EXPECT_EQ(others, codes{"a:11:18 the manager `M`"});
 }
 
 TEST_F(Across, ReportsVariableClassesThatDiffer) {
@@ -75,6 +84,7 @@ TEST_F(Across, ReportsVariableClassesThatDiffer) {
     EXPECT_EQ(add("b", other + variables("V", "5") + variables("W", "6")), codes());
     EXPECT_EQ(add("c", third + variables("V", "6") + variables("W", "6", "\tAlias=U\n")),
               codes{"S614 0 the variable class `V` has other intervals or another alias than in a"});
+    EXPECT_EQ(others, codes{"a:0:0 the other variable class `V`"});
 }
 
 TEST_F(Across, IsSilentAboutWhatIsNotWanted) {

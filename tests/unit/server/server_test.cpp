@@ -64,6 +64,32 @@ TEST(Server, AnswersInOrderAndForgetsCancelledRequests) {
     EXPECT_EQ(answers[3].at("id"), 4);
 }
 
+/* What a server with one source in a folder says after the client has answered whether it shows progress. */
+std::vector<std::string> progress_after(const json &answer) {
+    lsp::surroundings world = nothing();
+    world.read = [](const std::string &) { return found_in::CLASS; };
+    world.sources_in = [](const std::string &) { return std::vector<std::string>{"/x/a.cdefsrc"}; };
+    lsp::server server(world);
+    json able = {{"capabilities", {{"window", {{"workDoneProgress", true}}}}}, {"rootUri", "file:///x"}};
+    json asked;
+    for (const json &each : said(server, {request(1, "initialize", able), {{"method", "initialized"}}})) {
+        EXPECT_NE(each.value("method", ""), "$/progress") << "before the client has agreed";
+        if (each.value("method", "") == "window/workDoneProgress/create")
+            asked = each.at("id");
+    }
+    json response = answer;
+    response["id"] = asked;
+    std::vector<std::string> kinds;
+    for (const json &each : said(server, {response}))
+        kinds.push_back(each.at("params").at("value").at("kind"));
+    return kinds;
+}
+
+TEST(Server, ReportsProgressOnlyAfterTheClientHasAgreed) {
+    EXPECT_EQ(progress_after({{"result", nullptr}}), (std::vector<std::string>{"begin", "end"}));
+    EXPECT_EQ(progress_after({{"error", {{"code", -32803}, {"message", "no"}}}}), std::vector<std::string>());
+}
+
 TEST(Server, WaitsForNoMoreThanItCanHold) {
     lsp::server server(nothing());
     for (int i = 0; i < 256; ++i) {

@@ -1,4 +1,4 @@
-/* format.cpp: formats a source, and compiles what comes of it before it hands it over. */
+/* format.cpp: formats a source, and compiles the result to compare it with the source. */
 
 #include "formatter/format.h"
 
@@ -34,7 +34,7 @@ change difference(std::size_t begin, std::string_view before, std::string_view a
     return {begin + same, before.size() - tail - same, std::string(after.substr(same, after.size() - tail - same))};
 }
 
-/* What rows become, compared with the lines that they were. */
+/* Compares rows with the lines of the source. */
 class comparison {
 public:
     comparison(std::string_view whole, std::span<const line> in) : source(whole), lines(in) {}
@@ -66,13 +66,13 @@ public:
     }
 
 private:
-    /* Whether the source ends with this row, and it gets a newline: not if it is so long that the compiler would take a
-     * newline for another line. */
+    /* Whether this is the last row, and gets a newline. It gets none if it is so long that the compiler would read a
+     * newline as another line. */
     bool lacks_newline(const row &last) const {
         return !last.removed && !source.ends_with('\n') && is_short(lines[last.line].whole);
     }
 
-    /* Like the source, its last row has no newline if the source has none. */
+    /* The last row has no newline if the source has none. */
     std::string text_of(std::span<const row> rows, bool last) const {
         std::string text;
         for (const row &each : rows) {

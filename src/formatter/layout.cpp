@@ -25,7 +25,8 @@ std::size_t width_of(std::string_view text) {
     return column;
 }
 
-/* The text with blanks after it up to a column, but one at least: tabs, if there were only tabs and they lead there. */
+/* The text with blanks up to a column, at least one. They are tabs if there were only tabs and tabs reach the column.
+ */
 std::string filled(std::string text, std::size_t column, std::string_view blanks) {
     std::size_t now = width_of(text);
     if (blanks.find(' ') == std::string_view::npos && column % TAB == 0)
@@ -122,7 +123,7 @@ void remove_empty_lines(std::span<const line> lines, std::span<row> rows) {
         rows[i].removed = true;
 }
 
-/* The first of the comments in column 1 that are directly above the end of these lines: they belong to what follows. */
+/* The first of the comments in column 1 at the end of these lines: they belong to the stanza that follows. */
 std::size_t own_comments(std::span<const line> lines) {
     std::size_t first = lines.size();
     while (first > 0 && lines[first - 1].kind == line_kind::comment && lines[first - 1].indent.empty())

@@ -1,4 +1,4 @@
-/* lines.cpp: the lines of a source, as the compiler takes them apart. */
+/* lines.cpp: the lines of a source and their parts, as the compiler reads them. */
 
 #include "formatter/lines.h"
 

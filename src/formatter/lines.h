@@ -1,4 +1,4 @@
-/* lines.h: the lines of a source, as the compiler takes them apart. */
+/* lines.h: the lines of a source and their parts, as the compiler reads them. */
 #ifndef CDGEN_FORMATTER_LINES_H
 #define CDGEN_FORMATTER_LINES_H
 
@@ -29,7 +29,7 @@ struct line {
     std::string_view comment = {};
 };
 
-/* The bytes of a line that is read in one piece, without its newline. */
+/* Whether the compiler reads the line in one piece. The line is given without its newline. */
 bool is_short(std::string_view whole);
 
 /* The lines of a source. The last one may lack its newline; an empty source has none. */

@@ -11,14 +11,14 @@ namespace formatter {
 
 namespace {
 
-/* An attribute's row with the comments above it and those that continue its own, all next to each other. */
+/* Consecutive rows: an attribute, the comments above it, and those that continue its own comment. */
 struct item {
     const table_attrs *attr;
     std::size_t begin;
     std::size_t end;
 };
 
-/* Whether the attribute is written to a table that others are written to as well. */
+/* Whether the attribute is stored in a table that it shares with others. */
 bool stores_in_order(const table_attrs &attr) {
     switch (attr.ta_type) {
     case AT_STRING:
@@ -50,7 +50,7 @@ bool comes_before(const item &a, const item &b) {
     return language::comes_before(*a.attr, *b.attr);
 }
 
-/* The items in their new order: those that are stored in order keep theirs, the others are put between them. */
+/* The items in their new order. Those that the database stores in order keep it; the others are put between them. */
 std::vector<item> ordered(const std::vector<item> &items) {
     std::vector<item> stored;
     std::vector<item> others;
@@ -128,7 +128,7 @@ private:
 void put_in_order(std::vector<row> &rows, std::span<const line> lines, std::optional<std::size_t> fixed) {
     stanza_order stanzas(rows, lines);
     auto is_header = [](const line &each) { return each.kind == line_kind::header; };
-    /* Any line that is not taken apart may be the header of another stanza. */
+    /* Any verbatim line may be the header of another stanza. */
     auto ends_stanza = [](const line &each) {
         return each.kind == line_kind::header || each.kind == line_kind::verbatim;
     };

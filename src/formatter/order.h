@@ -10,8 +10,8 @@
 namespace formatter {
 
 /* Moves the rows of attributes, each with the comments above it, between the empty lines of its stanza. Lines that
- * store texts or values keep their order among each other, because the database has these in the order of the source.
- * fixed: a line whose stanza is left as it is; nothing: none. */
+ * store texts or values keep their order relative to each other, because the database stores these in the order of the
+ * source. fixed: a line whose stanza is not changed; nothing: there is none. */
 void put_in_order(std::vector<row> &rows, std::span<const line> lines, std::optional<std::size_t> fixed);
 
 } // namespace formatter

@@ -1,4 +1,4 @@
-/* same.cpp: what a source compiles to, so that two sources can be compared. */
+/* same.cpp: compares what two sources compile to. */
 
 #include "formatter/same.h"
 
@@ -14,7 +14,7 @@ namespace formatter {
 
 namespace {
 
-/* After it, a class without a Name is called; any name will do. */
+/* A class without a Name gets its name from the output; any will do. */
 constexpr const char *OUTPUT = "class.cdef";
 
 constexpr check::warning_set all_warnings() {

@@ -1,4 +1,4 @@
-/* same.h: what a source compiles to, so that two sources can be compared. */
+/* same.h: compares what two sources compile to. */
 #ifndef CDGEN_FORMATTER_SAME_H
 #define CDGEN_FORMATTER_SAME_H
 

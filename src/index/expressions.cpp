@@ -9,7 +9,7 @@ namespace source_index {
 
 namespace {
 
-/* A letter of any script: other bytes than ASCII's are parts of letters. */
+/* A letter of any script: bytes that are not ASCII are parts of letters. */
 bool is_letter(char c) {
     auto byte = static_cast<unsigned char>(c);
     return std::isalnum(byte) != 0 || c == '_' || byte >= 0x80;
@@ -19,7 +19,7 @@ bool is_digit(char c) {
     return c >= '0' && c <= '9';
 }
 
-/* Where the text in quotes that begins here ends, with its closing quote. */
+/* The end of the quoted text that begins here, after its closing quote. */
 std::size_t end_of_quoted(std::string_view text, std::size_t open) {
     for (std::size_t at = open + 1; at < text.size(); ++at) {
         if (text[at] == '\\')
@@ -39,7 +39,7 @@ std::size_t end_of_word(std::string_view text, std::size_t begin) {
 
 std::vector<expression_name> names_in(std::string_view expression) {
     std::vector<expression_name> found;
-    std::size_t member_at = std::string_view::npos; /* where a word would be an element of the name before it */
+    std::size_t member_at = std::string_view::npos; /* a word that begins here is an element of the name before it */
     for (std::size_t at = 0; at < expression.size();) {
         char c = expression[at];
         if (c == '"' || c == '\'') {

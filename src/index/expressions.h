@@ -1,4 +1,5 @@
-/* expressions.h: the names in an expression. Its grammar is the runtime's; what looks like a name is taken for one. */
+/* expressions.h: the names in an expression. Only the runtime knows its grammar; anything that looks like a name counts
+ * as one. */
 #ifndef CDGEN_INDEX_EXPRESSIONS_H
 #define CDGEN_INDEX_EXPRESSIONS_H
 
@@ -11,7 +12,7 @@ namespace source_index {
 
 struct expression_name {
     span at;             /* in the expression */
-    bool member = false; /* it is an element of the name before it: a point is between them */
+    bool member = false; /* true: an element of the name before it; a dot is between them */
 };
 
 /* The words of an expression that are outside of quotes and do not begin with a digit. */

@@ -17,7 +17,7 @@ struct span {
     bool is_empty() const {
         return begin == end;
     }
-    /* A place directly after the last byte counts too: a cursor may be there. */
+    /* The offset after the last byte counts too, because a cursor may be there. */
     bool touches(std::size_t offset) const {
         return begin <= offset && offset <= end;
     }
@@ -31,7 +31,7 @@ enum class line_kind : std::uint8_t { empty, comment, header, attribute };
 
 struct line {
     line_kind kind = line_kind::empty;
-    span whole; /* without the newline. A line that is too long is several */
+    span whole; /* without the newline. The compiler reads a long line in pieces; each piece is a line here */
     span text;  /* without comment and without blanks around; empty if there is none */
 };
 
@@ -41,7 +41,7 @@ std::vector<line> lines_of(std::string_view source);
 struct attribute_parts {
     bool has_equals = false; /* without, the name is the whole text */
     bool quoted = false;
-    bool closed = true; /* the quote at the beginning of the value has its partner */
+    bool closed = true; /* false: the opening quote has no closing quote */
     span name;
     span written; /* all after the equals sign */
     span value;   /* the same without quotes */

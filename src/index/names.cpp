@@ -36,7 +36,7 @@ bool is_dynamic(int kind) {
     return kind == SC_DYNAMIC_RESOURCE_ATTRIBUTE || kind == SC_DYNAMIC_CLASS_ATTRIBUTE;
 }
 
-/* Attributes that an expression of a stanza may mean, the likeliest first. */
+/* The kinds of attributes that an expression in a stanza may mean, the likeliest first. */
 std::array<name_kind, 4> meant_in_expression(int kind) {
     if (kind == SC_DYNAMIC_CLASS_ATTRIBUTE)
         return {name_kind::dynamic_class, name_kind::persistent_class, name_kind::dynamic_resource,
@@ -62,7 +62,7 @@ public:
 private:
     using key = std::tuple<name_kind, std::size_t, std::string_view>;
 
-    /* The name's number; it is new if it was not known. */
+    /* The number of a name, which is added if it is new. */
     std::size_t number_of(name_kind kind, std::size_t scope, std::string_view text) {
         auto [at, is_new] = known.try_emplace({kind, scope, text}, made.all.size());
         if (is_new)
@@ -118,7 +118,7 @@ private:
             made.mentions.push_back({place, number_of(kind, scope, place.of(source)), at, false});
     }
 
-    /* Words that no attribute has as its name are the expression's own. */
+    /* Words that are not names of attributes belong to the expression's own language. */
     void refer_in_expression(const attribute &line, std::size_t at) {
         span value = line.parts.value;
         std::optional<std::size_t> latest;

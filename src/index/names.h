@@ -24,7 +24,8 @@ enum class name_kind : std::uint8_t {
     element
 };
 
-/* A name of a source: of attributes and actions one for each kind and class, of elements one for each run. */
+/* A name in a source. Names of attributes and actions are distinct in each kind and class, those of elements in each
+ * run. */
 struct named {
     name_kind kind;
     std::size_t scope = 0; /* the number of the class; of an element its run; 0 for variable classes */
@@ -32,7 +33,7 @@ struct named {
     bool in_expressions = false; /* some expression uses it */
 };
 
-/* A place that has a name. */
+/* A place where a name is written. */
 struct mention {
     span at;
     std::size_t name = 0;   /* in names::all */
@@ -44,7 +45,7 @@ struct names {
     std::vector<named> all;
     std::vector<mention> mentions; /* in the order of the source */
 
-    /* The mention that an offset is in; null: there is none. */
+    /* The mention at an offset; null: there is none. */
     const mention *at(std::size_t offset) const;
     /* All mentions of a name, in order. */
     std::vector<mention> of(std::size_t name) const;
@@ -53,7 +54,7 @@ struct names {
 /* index: that of the source */
 names names_of(std::string_view source, const index &of);
 
-/* The kind of name that a stanza of this kind defines; none for one that defines no name. */
+/* The kind of name that stanzas of this kind define; null: none. */
 const name_kind *defined_by(int stanza_kind);
 
 } // namespace source_index

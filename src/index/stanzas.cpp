@@ -11,7 +11,7 @@ namespace source_index {
 
 namespace {
 
-/* The stanza that a run of elements after these stanzas describes. */
+/* The stanza whose structure a run of elements after these stanzas describes. */
 std::size_t owner_of_run(const std::vector<stanza> &before, const srtable_ctrl &kind) {
     bool of_attribute = kind.sc_sd_owner->is_attribute();
     bool of_action = kind.sc_sd_owner->of_action != nullptr;
@@ -54,7 +54,7 @@ void add_attribute(index &to, std::string_view source, std::size_t line_number) 
     current.attributes.push_back(one);
 }
 
-/* Kinds of one family have one sequence of numbers. */
+/* Kinds that share their numbers are in one family. */
 int number_family(int kind) {
     switch (kind) {
     case SC_DYNAMIC_RESOURCE_ATTRIBUTE:
@@ -66,7 +66,7 @@ int number_family(int kind) {
     }
 }
 
-/* Nothing for a text that is not a decimal number which a record can hold. */
+/* Nothing for a text that is not a decimal number, or is too large for a record. */
 std::optional<long long> number_in(std::string_view text) {
     long long number = 0;
     auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);

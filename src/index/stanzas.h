@@ -1,5 +1,5 @@
-/* stanzas.h: the stanzas of a source and their attributes. A source with mistakes has them too, as far as they can be
- * understood. */
+/* stanzas.h: the stanzas of a source and their attributes. In a source with errors, as many as can be
+ * recognised. */
 #ifndef CDGEN_INDEX_STANZAS_H
 #define CDGEN_INDEX_STANZAS_H
 
@@ -49,21 +49,21 @@ struct stanza {
     vx_uint32_t required_seen() const;
 };
 
-/* All of a source. It keeps no bytes of it: whoever asks it passes the same source. */
+/* The index of a source. It contains no text, so its functions need the source again. */
 struct index {
     std::vector<line> lines;
     std::vector<stanza> stanzas;
 
-    /* The line that an offset is in; of two pieces of a long line the first. */
+    /* The line that contains an offset. */
     std::size_t line_at(std::size_t offset) const;
-    /* The stanza that a line belongs to: that of the latest header; NONE before the first one. */
+    /* The stanza that a line belongs to; NONE before the first header. */
     std::size_t stanza_at(std::size_t line) const;
     /* The attribute of a line; null: it has none. */
     const attribute *attribute_at(std::size_t line) const;
     /* All of a stanza, from its header to the end of its last line. */
     span extent_of(const stanza &of) const;
-    /* The next number of the stanza's kind in its class that nothing has: after the highest one. Persistent and dynamic
-     * attributes of a level share their numbers. */
+    /* The number after the highest one in use by stanzas of this kind in the class. Persistent and dynamic attributes
+     * of a level share their numbers. */
     std::optional<long long> next_id(std::string_view source, const stanza &of) const;
 };
 

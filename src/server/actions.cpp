@@ -17,7 +17,7 @@ constexpr std::string_view QUICK_FIX = "quickfix";
 constexpr std::string_view REWRITE = "refactor.rewrite";
 constexpr std::string_view FIX_ALL = "source.fixAll.cdef";
 
-/* Whether the client wants actions of a kind: it names kinds that contain them, or none. */
+/* Whether the client wants actions of this kind. A client that names no kinds wants all. */
 bool is_wanted(const json &params, std::string_view kind) {
     const json *context = optional_member(params, "context");
     const json *only = context == nullptr ? nullptr : optional_member(*context, "only");
@@ -31,7 +31,7 @@ bool is_wanted(const json &params, std::string_view kind) {
     });
 }
 
-/* What a request asks about, and the actions for it. */
+/* Collects the actions for a request. */
 class collector {
 public:
     collector(session &of, document &about, const json &asked)
@@ -107,7 +107,7 @@ void collector::add_corrections() {
     }
 }
 
-/* After the required lines that the stanza has: those that are optional follow. */
+/* The line after which missing lines are inserted: the last required one in front of all optional ones. */
 std::size_t line_before_missing(const source_index::stanza &of) {
     std::size_t line = of.first_line;
     for (const source_index::attribute &each : of.attributes) {
@@ -146,7 +146,7 @@ void collector::add_free_number() {
         add("Use the next free number, " + next, QUICK_FIX, json::array({edit(place.attribute->parts.value, next)}));
 }
 
-/* Only where the value stays the same. */
+/* Only if the value is the same with quotes. */
 void collector::add_quotes() {
     place_in_source place = place_at(in, part.begin);
     if (place.attribute == nullptr || place.attribute->parts.quoted || place.attribute->parts.value.is_empty())
@@ -161,7 +161,7 @@ void collector::add_quotes() {
         add("Put the value in quotes", REWRITE, json::array({edit(place.attribute->parts.value, quotes)}));
 }
 
-/* Where two texts differ: what is between their common beginning and their common end. */
+/* The parts of two texts between their common beginning and their common end. */
 struct difference {
     stretch old_part;
     stretch new_part;
@@ -177,7 +177,7 @@ difference difference_of(std::string_view before, std::string_view after) {
         ++end;
     while (end > 0 && before[before.size() - end] != '\n')
         --end;
-    end -= end > 0 ? 1 : 0; /* a line's end is not taken apart */
+    end -= end > 0 ? 1 : 0; /* do not split the end of a line */
     return {{begin, before.size() - end}, {begin, after.size() - end}};
 }
 

@@ -1,5 +1,4 @@
-/* actions.h: changes that an editor offers at a place: corrections of findings, lines that are missing, numbers that
- * are free, quotes. */
+/* actions.h: changes that an editor offers at a place: corrections of findings, missing lines, free numbers, quotes. */
 #ifndef CDGEN_SERVER_ACTIONS_H
 #define CDGEN_SERVER_ACTIONS_H
 

@@ -15,8 +15,8 @@ namespace {
 using source_index::index;
 using source_index::stanza;
 
-/* How many stanzas of the same kind, in the same class, come before this one. Maps and variable classes are not of one
- * class. */
+/* The number of stanzas of the same kind before this one. in_class: only those of the same class count; maps and
+ * variable classes do not belong to one class. */
 std::size_t ordinal_of(const index &of, std::size_t number, bool in_class) {
     const stanza &wanted = of.stanzas[number];
     auto end = of.stanzas.begin() + static_cast<std::ptrdiff_t>(number);
@@ -25,7 +25,7 @@ std::size_t ordinal_of(const index &of, std::size_t number, bool in_class) {
     }));
 }
 
-/* The section of a type that has this position among those of the type. */
+/* The offset of a section. position: its number among the sections of its type, from 0. */
 std::optional<std::size_t> section_offset(const cdb::database &db, cdb_dsect_type_t type, std::size_t position) {
     for (std::size_t at = 0; at < db.section_count(); ++at)
         if (db.anchor(at).cda_type == type && position-- == 0)
@@ -50,7 +50,8 @@ std::optional<class_place> class_of(const cdb::database &db, const stanza &of) {
     return class_place{*found, *offset};
 }
 
-/* A record in a table of its class. The name shows that it is the stanza's. */
+/* The offset of a record in its class. Nothing unless it has the stanza's name, since it may belong to another stanza.
+ */
 template <class List>
 std::optional<std::size_t> in_table(const List &records, std::size_t table, std::size_t ordinal, std::string_view name,
                                     std::size_t record_size) {
@@ -87,7 +88,7 @@ std::optional<std::size_t> attribute_offset(const cdb::resource_class &in, int k
     }
 }
 
-/* What refers to the run of an element. owner: where the record of the attribute or action is in the class */
+/* The reference to an element's run. owner: the offset of the attribute's or action's record in the class. */
 cdb_ref_t run_of(const class_place &in, const cdb::bytes &section, const stanza &element, int owner_kind,
                  std::size_t owner) {
     const sd_owner &who = *element.row().sc_sd_owner;

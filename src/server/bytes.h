@@ -12,12 +12,12 @@
 
 namespace lsp {
 
-/* The offset of the record that a stanza became, in bytes from the start of the file. Nothing if there is none, or if
- * it cannot be told from others. image: what the source compiles to. */
+/* The offset of a stanza's record, in bytes from the start of the file. Nothing if there is no record, or if it cannot
+ * be told from others. image: the database that the source compiles to. */
 std::optional<std::size_t> record_offset(std::string_view source, const source_index::index &of, std::size_t stanza,
                                          std::span<const std::byte> image);
 
-/* Bytes in hexadecimal with blanks between them; three points stand for those after the first 16. */
+/* Bytes in hexadecimal with blanks between them; if there are more than 16, "..." stands for the rest. */
 std::string hexadecimal(std::span<const std::byte> bytes);
 
 } // namespace lsp

@@ -17,7 +17,7 @@ struct compiled_source {
     build::class_facts facts;
 };
 
-/* uri: the source's; a class without a Name is called after it. Nothing for a source with errors. */
+/* Compiles a source; nothing if it has errors. uri: the source's. A class without a Name gets its name from it. */
 std::optional<compiled_source> compile(std::string_view text, const std::string &uri);
 
 } // namespace lsp

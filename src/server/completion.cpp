@@ -20,7 +20,7 @@ namespace {
 using source_index::name_kind;
 using source_index::stanza;
 
-/* Kinds of items. */
+/* Kinds of items, as the protocol numbers them. */
 constexpr int PROPERTY = 10;
 constexpr int VALUE = 12;
 constexpr int ENUM_MEMBER = 20;
@@ -47,7 +47,7 @@ public:
         all.push_back(std::move(item));
         return all.back();
     }
-    /* The text is a snippet if the client takes one. */
+    /* The text is a snippet if the client supports snippets. */
     json &add_snippet(std::string_view label, int kind, std::string_view text, const std::string &documentation) {
         constexpr int AS_IT_IS = 1; /* insertTextMode: the client does not indent it */
         json &item = add(label, kind, text, documentation);
@@ -119,7 +119,7 @@ bool may_begin(const place_in_source &place, int kind) {
     }
 }
 
-/* What begins a snippet's place has to be escaped in it. */
+/* Escapes the characters that have a meaning in a snippet. */
 std::string escaped(std::string_view text) {
     std::string safe;
     for (char c : text) {
@@ -130,7 +130,7 @@ std::string escaped(std::string_view text) {
     return safe;
 }
 
-/* The header and the required lines, in order, with values to be replaced. */
+/* The header and the required lines in order, with values for the author to replace. */
 std::string stanza_text(const place_in_source &place, int kind, bool snippet) {
     stanza fresh;
     fresh.kind = kind;
@@ -227,7 +227,7 @@ void add_properties(items &to, const place_in_source &place, const stretch &item
             to.add(name, ENUM_MEMBER, name, value_documentation(attr, name));
 }
 
-/* Attributes of the class; after a point the elements of the attribute before it. */
+/* Attributes of the class or, after a dot, the elements of the attribute before it. */
 void add_expression_names(items &to, const place_in_source &place, const stretch &word) {
     const source_index::names &names = place.in.names();
     auto scope = static_cast<std::size_t>(place.stanza->class_number);
@@ -251,7 +251,7 @@ void add_expression_names(items &to, const place_in_source &place, const stretch
     }
 }
 
-/* A default is one of the values that the stanza calls valid. */
+/* A default must be one of the stanza's valid values. */
 void add_valid_values(items &to, const place_in_source &place) {
     std::set<std::string_view> shown;
     for (const source_index::attribute &each : place.stanza->attributes) {
@@ -304,7 +304,8 @@ void add_by_type(items &to, const place_in_source &place, const stretch &part) {
     }
 }
 
-/* The part of the value up to the place that an item replaces. */
+/* The part of the value that an item replaces: one item of a list, one word of an expression, or all of it. It ends at
+ * the cursor. */
 stretch value_part(const place_in_source &place) {
     const table_attrs &attr = *place.attribute->known;
     stretch part = {place.attribute->parts.value.begin, place.offset};

@@ -11,7 +11,7 @@ namespace lsp {
 
 namespace {
 
-/* The page has an anchor for each code, in small letters. */
+/* The page has an anchor for each code, in lower case. */
 std::string link_to(const std::string &explanations, std::string_view code) {
     std::string link = explanations + "#";
     for (char c : code)
@@ -59,7 +59,7 @@ void append_number(std::string &to, std::size_t number) {
     to += std::to_string(number);
 }
 
-/* Writes the diagnostics of one document. There may be very many, so that no document of JSON values is made first. */
+/* Writes the diagnostics of one document as text: building JSON values for very many of them would take too long. */
 class list_writer {
 public:
     list_writer(std::string_view text, const line_table &lines, const std::string &called,

@@ -12,29 +12,29 @@
 
 namespace lsp {
 
-/* What a client understands, and where explanations are. */
+/* The form in which the client wants diagnostics. */
 struct diagnostic_form {
     encoding units = encoding::utf16;
-    bool relates = true;      /* the client shows related places; without, notes are added to the message */
-    bool links = true;        /* the client follows links of codes */
-    std::string explanations; /* where the page about all codes is, a URI; empty: nowhere */
+    bool relates = true;      /* true: notes become related places; false: they are added to the message */
+    bool links = true;        /* true: the client shows links of codes */
+    std::string explanations; /* URI of the page that explains the codes; empty: there is none */
 };
 
-/* Where the places of findings are in a text, in bytes. */
+/* Converts the places of findings to offsets in a text. */
 class finding_places {
 public:
     explicit finding_places(std::string_view of_text);
 
-    /* A place without column is the text of its line; one without line the beginning of the source. */
+    /* A place without a column is the text of its line; one without a line is the beginning of the source. */
     stretch of(const check::place &at) const;
-    /* An edit's; nothing is removed where its end is its beginning. */
+    /* The bytes that an edit removes; empty for an insertion. */
     stretch of(const check::edit &change) const;
 
 private:
     std::size_t offset(std::size_t line, std::size_t column) const;
 
     std::string_view text;
-    std::vector<std::size_t> begins; /* of the lines that end with a newline, as findings count them */
+    std::vector<std::size_t> begins; /* of the lines as findings count them: only newlines end them */
 };
 
 /* A place in another document. */

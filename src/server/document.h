@@ -1,4 +1,4 @@
-/* document.h: a source that is open in an editor, and what has been found out about it. */
+/* document.h: a source that is open in an editor, with results that are computed when they are first needed. */
 #ifndef CDGEN_SERVER_DOCUMENT_H
 #define CDGEN_SERVER_DOCUMENT_H
 
@@ -15,7 +15,7 @@
 
 namespace lsp {
 
-/* A text that changes, and the places in it. */
+/* A text that changes. Results about it are kept until the next change. */
 class document {
 public:
     document(std::string its_uri, int number, std::string whole)
@@ -34,7 +34,7 @@ public:
         return table;
     }
 
-    /* All of the text, or a part of it, gives way to another text. What was found out is forgotten. */
+    /* Replaces all of the text or a part of it, and discards all results. */
     void replace(std::string by);
     void replace(const range &part, std::string_view by, encoding units);
     void set_version(int number) {
@@ -51,17 +51,17 @@ public:
         return {content, table, units};
     }
 
-    /* What cdef check reports of the text. The text is checked once. */
+    /* The findings of cdef check. */
     const std::vector<check::finding> &findings(const check::warning_set &wanted);
 
-    /* What is where in the text. It is read once. */
+    /* The stanzas and names of the text. */
     const source_index::index &index();
     const source_index::names &names();
 
-    /* What the text compiles to; null if it has errors. It is compiled once. */
+    /* What the text compiles to; null if it has errors. */
     const compiled_source *compiled();
 
-    /* What was found out of the text is found out anew when it is asked for. */
+    /* Discards all results. */
     void forget();
 
 private:

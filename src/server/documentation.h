@@ -10,7 +10,7 @@
 namespace lsp {
 
 std::string stanza_documentation(const srtable_ctrl &kind);
-/* With the record and the fields that lines of the attribute become. */
+/* Includes the record and the fields that the attribute fills. */
 std::string attribute_documentation(const srtable_ctrl &kind, const table_attrs &attr);
 /* Of a data type, a variable type or a property of the attribute; empty for any other value. */
 std::string value_documentation(const table_attrs &attr, std::string_view value);

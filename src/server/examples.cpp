@@ -1,4 +1,4 @@
-/* examples.cpp: values to begin with. */
+/* examples.cpp: values for lines that the server adds to a source. */
 
 #include "server/examples.h"
 

@@ -1,4 +1,4 @@
-/* examples.h: values to begin with, in lines that the server writes. */
+/* examples.h: values for lines that the server adds to a source. */
 #ifndef CDGEN_SERVER_EXAMPLES_H
 #define CDGEN_SERVER_EXAMPLES_H
 
@@ -10,11 +10,11 @@
 
 namespace lsp {
 
-/* A value that the compiler accepts. The numbers of records and elements are the next free ones. */
+/* A value that the compiler accepts. Ids and indices are the next free ones. */
 std::string example_value(std::string_view source, const source_index::index &of, const source_index::stanza &in,
                           const table_attrs &attr);
 
-/* The required attributes of a stanza that it does not have, in the order of the catalogue. */
+/* The required attributes that a stanza lacks, in the order of the catalogue. */
 std::vector<const table_attrs *> missing_in(const source_index::stanza &in);
 
 } // namespace lsp

@@ -1,4 +1,4 @@
-/* folders.cpp: what the client says of its folders, and of files and settings in them. */
+/* folders.cpp: messages about the client's folders, and about the files and settings in them. */
 
 #include "server/folders.h"
 
@@ -12,7 +12,7 @@ namespace lsp {
 
 namespace {
 
-/* Of a list of objects that have a URI. */
+/* The paths in a list of objects with a URI. */
 std::vector<std::string> paths_in(const json *list) {
     std::vector<std::string> paths;
     if (list != nullptr && list->is_array())

@@ -1,4 +1,4 @@
-/* folders.h: what the client says of its folders, and of files and settings in them. */
+/* folders.h: messages about the client's folders, and about the files and settings in them. */
 #ifndef CDGEN_SERVER_FOLDERS_H
 #define CDGEN_SERVER_FOLDERS_H
 
@@ -9,20 +9,20 @@
 
 namespace lsp {
 
-/* The paths of the folders that the client begins with. */
+/* The paths of the folders in an initialize request. */
 std::vector<std::string> folders_in(const json &initialize);
 
-/* Looks at the folders, and asks the client to watch the files in them. */
+/* Adds the folders, and asks the client to watch their files. */
 void begin_watching(session &now, const std::vector<std::string> &folders);
 
 void did_change_folders(session &now, const json &params);
 void did_change_files(session &now, const json &params);
-/* Settings are in project files, which are read anew. */
+/* Reads all project files again. */
 void did_change_settings(session &now, const json &params);
-/* The client does not wait for the end of what has been announced to it. */
+/* The user has cancelled the check of the folders. */
 void did_cancel_progress(session &now, const json &params);
 
-/* Names in all sources. */
+/* Finds names in all sources. */
 json workspace_symbols(session &now, const json &params);
 
 } // namespace lsp

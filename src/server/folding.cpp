@@ -1,4 +1,4 @@
-/* folding.cpp: which lines of a document can be hidden behind their first one. */
+/* folding.cpp: which lines of a document can be folded into one. */
 
 #include "server/folding.h"
 
@@ -12,7 +12,7 @@ class folds {
 public:
     folds(document &of, encoding units) : in(of), positions(of.positions(units)) {}
 
-    /* From a line to another one of the index. */
+    /* Adds a fold, if it has several lines. first, last: in the index */
     void add(std::size_t first, std::size_t last, const char *kind) {
         std::size_t start = positions.at(in.index().lines[first].whole.begin).line;
         std::size_t end = positions.at(in.index().lines[last].whole.end).line;

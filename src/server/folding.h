@@ -1,4 +1,4 @@
-/* folding.h: which lines of a document can be hidden behind their first one. */
+/* folding.h: which lines of a document can be folded into one. */
 #ifndef CDGEN_SERVER_FOLDING_H
 #define CDGEN_SERVER_FOLDING_H
 

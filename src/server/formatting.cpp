@@ -32,7 +32,7 @@ json format_document(session &now, const json &params) {
     return formatted(now, now.document_in(params), {});
 }
 
-/* A range that ends where a line begins does not have that line. */
+/* A range that ends at the beginning of a line does not include that line. */
 json format_range(session &now, const json &params) {
     document &in = now.document_in(params);
     stretch part = in.stretch_of(range_from(member(params, "range")), now.client.units);

@@ -1,4 +1,4 @@
-/* framing.cpp: messages between bytes. */
+/* framing.cpp: finds messages in a stream of bytes. */
 
 #include "server/framing.h"
 
@@ -46,7 +46,7 @@ bool names_utf8(std::string_view type) {
     return is_same_name(charset, "utf-8") || is_same_name(charset, "utf8");
 }
 
-/* Whether the line is a field. A length that is no number, or a second one, is none. */
+/* Returns false if the line is not a field, or is a length that is not a number, or a second length. */
 bool take_field(header_fields &to, std::string_view line) {
     std::size_t colon = line.find(':');
     if (colon == std::string_view::npos || colon == 0)
@@ -64,7 +64,7 @@ bool take_field(header_fields &to, std::string_view line) {
     return true;
 }
 
-/* Of a header without its empty line. Nothing if it is none, or has no length. */
+/* The fields of a header, which is given without its empty line. Nothing if it is malformed or has no length. */
 std::optional<header_fields> fields_of(std::string_view header) {
     header_fields fields;
     while (!header.empty()) {
@@ -78,7 +78,7 @@ std::optional<header_fields> fields_of(std::string_view header) {
 
 } // namespace
 
-/* Whether all of it is there. */
+/* Returns true once the header is complete, or too long. */
 bool frame_reader::take_header(std::string_view &bytes) {
     while (!bytes.empty() && header.size() < HEADER_MAX && !header.ends_with(HEADER_END)) {
         header += bytes.front();

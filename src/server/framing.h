@@ -1,4 +1,4 @@
-/* framing.h: messages between bytes: each has a header that says how long it is. No process, no JSON. */
+/* framing.h: finds messages in a stream of bytes by their headers. Knows neither processes nor JSON. */
 #ifndef CDGEN_SERVER_FRAMING_H
 #define CDGEN_SERVER_FRAMING_H
 
@@ -14,10 +14,10 @@ constexpr std::size_t HEADER_MAX = 4096;             /* bytes, with the empty li
 constexpr std::size_t BODY_MAX = 32UL * 1024 * 1024; /* bytes */
 
 enum class frame_state : std::uint8_t {
-    whole,         /* the body is there */
+    whole,         /* the body is complete */
     too_large,     /* the body is not kept: it has more than BODY_MAX bytes */
-    other_charset, /* nor is one in another encoding than UTF-8 */
-    bad_header     /* where the next frame begins is not known: nothing after it can be read */
+    other_charset, /* the body is not kept: it is not in UTF-8 */
+    bad_header     /* the beginning of the next frame is unknown: nothing more can be read */
 };
 
 struct frame {
@@ -25,14 +25,14 @@ struct frame {
     std::string body = {};
 };
 
-/* Cuts a stream of bytes into frames. It keeps one header and one body at the most. */
+/* Cuts a stream of bytes into frames. Keeps at most one header and one body. */
 class frame_reader {
 public:
-    /* Takes bytes from the front of these, at most one frame's; returns the frame when it is complete. After a bad
-     * header it takes everything and returns nothing more. */
+    /* Removes the bytes of at most one frame from the front; returns the frame once it is complete. After a bad header
+     * it removes everything and returns nothing. */
     std::optional<frame> take(std::string_view &bytes);
 
-    /* Whether no frame has begun. */
+    /* Whether the stream is between two frames. */
     bool is_between() const {
         return header.empty() && !in_body;
     }

@@ -1,4 +1,4 @@
-/* hover.cpp: what the name or value at a place means. */
+/* hover.cpp: the meaning of the name or value at a place. */
 
 #include "server/hover.h"
 
@@ -33,7 +33,7 @@ std::string at_offset(std::size_t offset) {
     return "offset " + text::hex(offset);
 }
 
-/* "in the database: offset 0x1f4, bytes 01 00 00 00" for each field that the attribute's lines fill. */
+/* Name, offset and bytes of each field that the attribute fills. */
 std::string bytes_of(const place_in_source &place) {
     std::optional<std::size_t> record = offset_of_record(place);
     if (!record)
@@ -61,7 +61,7 @@ std::string record_place(const place_in_source &place) {
            std::to_string(language::record_of(place.stanza->row()).size) + " bytes";
 }
 
-/* The part of a list of properties that an offset is in. */
+/* The item of a comma-separated list that contains an offset. */
 stretch item_at(std::string_view source, const stretch &list, std::size_t offset) {
     stretch item = list;
     for (std::size_t at = list.begin; at < list.end; ++at)
@@ -79,7 +79,7 @@ std::string name_text(const place_in_source &place) {
     return mention == nullptr ? std::string() : name_documentation(place.in, mention->name);
 }
 
-/* The place for the text of a message number, from the class's catalog. */
+/* The text of a message number. */
 std::string message_text(const session &now, const place_in_source &place) {
     const source_index::attribute &attribute = *place.attribute;
     if (!now.world.message_text || !is_message_number(place.stanza->row(), *attribute.known))
@@ -96,7 +96,7 @@ std::string message_text(const session &now, const place_in_source &place) {
     return text ? "\n- text: " + *text : std::string();
 }
 
-/* On the value: what the value means, too. */
+/* For an attribute; with the cursor on its value, also for the value. */
 shown attribute_shown(const session &now, const place_in_source &place) {
     const source_index::attribute &attribute = *place.attribute;
     std::string text =

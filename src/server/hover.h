@@ -1,4 +1,4 @@
-/* hover.h: what the name or value at a place means, and what it becomes in the database. */
+/* hover.h: the meaning of the name or value at a place, and what it becomes in the database. */
 #ifndef CDGEN_SERVER_HOVER_H
 #define CDGEN_SERVER_HOVER_H
 

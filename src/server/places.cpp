@@ -1,4 +1,4 @@
-/* places.cpp: what is at the place in a document that a request names. */
+/* places.cpp: the place in a document that a request is about, and what is there. */
 
 #include "server/places.h"
 

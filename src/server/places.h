@@ -1,4 +1,4 @@
-/* places.h: what is at the place in a document that a request names. */
+/* places.h: the place in a document that a request is about, and what is there. */
 #ifndef CDGEN_SERVER_PLACES_H
 #define CDGEN_SERVER_PLACES_H
 
@@ -14,7 +14,7 @@ struct place_in_source {
     const source_index::attribute *attribute; /* null: the line has none */
     bool in_comment;                          /* after the line's text, where a comment begins */
 
-    /* Whether the attribute is one that the stanza's kind has. */
+    /* Whether stanzas of this kind have the attribute. */
     bool has_known_attribute() const {
         return attribute != nullptr && attribute->known != nullptr;
     }
@@ -25,16 +25,16 @@ struct place_in_source {
 
 place_in_source place_at(document &in, std::size_t offset);
 
-/* The place that the parameters of a request name: a document and a position. */
+/* The place given by the parameters of a request, a document and a position. */
 place_in_source place_in(session &now, const json &params);
 
-/* What defines a name of the document, as Markdown; empty if nothing does. */
+/* The definition of a name as Markdown; empty if the name is not defined. */
 std::string name_documentation(document &in, std::size_t name);
 
-/* A location, or a list of several. */
+/* A part of a document as the protocol's Location. */
 json location_of(const session &now, document &in, const stretch &part);
 
-/* A workspace edit of one document, whose edits are these. */
+/* A workspace edit with these edits of one document. */
 json workspace_edit(const session &now, const document &of, json edits);
 /* An edit of bytes. A position cannot be between a carriage return and a newline: where the bytes begin or end there,
  * the edit covers both. */

@@ -1,4 +1,4 @@
-/* positions.cpp: places of a text as the protocol counts them. */
+/* positions.cpp: positions as the protocol counts them. */
 
 #include "server/positions.h"
 
@@ -11,7 +11,7 @@ namespace lsp {
 
 namespace {
 
-/* Whether a line begins after this byte. A carriage return with a newline after it leaves that to the newline. */
+/* Whether this byte ends a line. A carriage return before a newline does not: the newline does. */
 bool ends_line(std::string_view text, std::size_t at) {
     return text[at] == '\n' || (text[at] == '\r' && (at + 1 == text.size() || text[at + 1] != '\n'));
 }
@@ -27,7 +27,7 @@ struct character {
     std::size_t units;
 };
 
-/* What is not UTF-8 is read as U+FFFD. */
+/* Bytes that are not UTF-8 are read as U+FFFD. */
 character first_of(std::string_view text, encoding units) {
     constexpr std::size_t REPLACEMENT_BYTES = 3;
     constexpr std::size_t ASTRAL_BYTES = 4;
@@ -58,7 +58,7 @@ std::size_t line_table::line_of(std::size_t offset) const {
     return static_cast<std::size_t>(std::upper_bound(begins.begin(), begins.end(), offset) - begins.begin()) - 1;
 }
 
-/* The byte before the change is looked at again: it may be a carriage return that now has a newline after it. */
+/* The byte before the change is examined too: it may be a carriage return that a newline now follows. */
 void line_table::change(std::string_view changed, stretch replaced, std::size_t length) {
     auto first = std::lower_bound(begins.begin() + 1, begins.end(), std::max<std::size_t>(replaced.begin, 1));
     auto last = std::upper_bound(first, begins.end(), replaced.end);

@@ -15,21 +15,21 @@ namespace lsp {
 /* Reads each project file once, until it is forgotten. */
 class projects {
 public:
-    /* The warnings that are wanted in a document: those of its project file; all if there is none, if it has errors, or
-     * if the document is not a file. */
+    /* The warnings that a document's project file turns on. All are on if there is no project file, if it has errors,
+     * or if the document is not a file. */
     const check::warning_set &wanted_in(const std::string &uri);
 
-    /* Everything is read anew when it is asked for. */
+    /* Discards everything, so that it is read again when it is needed. */
     void forget() {
         by_directory.clear();
         by_file.clear();
     }
 
-    /* What is wrong with the project files that have been read since this was last asked: by file. A file without
-     * errors has an empty list. */
+    /* The problems of the project files that have been read since the last call, by file. A file without problems has
+     * an empty list. */
     std::map<std::string, std::vector<config::problem>> take_problems();
 
-    /* Read in place of all project files; empty: none at all is read. */
+    /* Read instead of all project files; empty: none is read. */
     std::optional<std::string> only;
 
 private:

@@ -1,4 +1,4 @@
-/* publishing.cpp: findings on their way to the client. */
+/* publishing.cpp: sends findings to the client. */
 
 #include "server/publishing.h"
 
@@ -16,7 +16,7 @@ location location_in(const document &other, const check::place &at, encoding uni
     return {other.uri(), other.positions(units).of(finding_places(other.text()).of(at))};
 }
 
-/* A place in a source that another one contradicts, as it is in the editor or on the disk. */
+/* A place in another source: in its text in the editor or else in the file. */
 location location_elsewhere(const session &now, const check::elsewhere &other) {
     auto open = now.open.find(other.file);
     if (open != now.open.end())
@@ -25,7 +25,7 @@ location location_elsewhere(const session &now, const check::elsewhere &other) {
     return location_in(stored, other.what.at, now.client.units);
 }
 
-/* The findings of a text, those of its own before those that other classes cause. */
+/* The findings of a text, followed by those that other classes cause. */
 std::string diagnostics_in(session &now, const std::string &uri, const document &in,
                            std::vector<check::finding> findings) {
     std::vector<check::finding> across = now.sources.across(key_of(uri));
@@ -34,7 +34,7 @@ std::string diagnostics_in(session &now, const std::string &uri, const document 
     return diagnostics_text(in.text(), in.lines(), uri, findings, now.form(), elsewhere);
 }
 
-/* A line counts from 0, or is the first one; a column counts characters. */
+/* A problem without a line is shown in the first one. Its columns count characters. */
 json problem_diagnostic(const config::problem &what, const document &in, encoding units) {
     std::size_t line = what.line > 0 ? static_cast<std::size_t>(what.line) - 1 : 0;
     stretch part;
@@ -81,7 +81,7 @@ void publish(session &now, const std::string &uri) {
     json params = {{"uri", open == now.open.end() ? uri : open->second.uri()}};
     if (!found.version.is_null())
         params["version"] = found.version;
-    /* The list may be long, and is JSON already. */
+    /* The list, which may be long, is already JSON text. */
     std::string text = R"({"jsonrpc":"2.0","method":"textDocument/publishDiagnostics","params":{"diagnostics":)" +
                        found.diagnostics + "," + written(params).substr(1) + "}";
     now.outbox.push_back(std::move(text));

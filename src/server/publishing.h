@@ -1,4 +1,4 @@
-/* publishing.h: findings on their way to the client, which gets them by itself or asks for them. */
+/* publishing.h: sends findings to the client. */
 #ifndef CDGEN_SERVER_PUBLISHING_H
 #define CDGEN_SERVER_PUBLISHING_H
 
@@ -8,14 +8,14 @@
 
 namespace lsp {
 
-/* Sends all findings of a document, as it is open or stored; none if it is neither. A client that asks for findings is
- * told to ask again instead. */
+/* Sends all findings of a document: of its text in the editor or else of the file; an empty list if there is neither. A
+ * client that requests findings is told to request them again instead. */
 void publish(session &now, const std::string &uri);
 
-/* Sends what is wrong with project files that have been read. */
+/* Sends the problems of the project files that have been read. */
 void publish_problems(session &now);
 
-/* All findings of a document, as it is open or stored. */
+/* All findings of a document: of its text in the editor or else of the file. */
 struct report_of_document {
     json version;                   /* null for a document that is not open */
     std::string diagnostics = "[]"; /* JSON */

@@ -1,4 +1,4 @@
-/* pulling.cpp: answers clients that ask for findings. */
+/* pulling.cpp: answers clients that request findings. */
 
 #include "server/pulling.h"
 
@@ -14,7 +14,7 @@ namespace lsp {
 
 namespace {
 
-/* The same findings have the same name. */
+/* Equal findings have equal identifiers. */
 std::string result_id(const std::string &diagnostics) {
     return std::to_string(std::hash<std::string>()(diagnostics));
 }
@@ -29,7 +29,7 @@ json pulled(session &now, const std::string &uri, const json *previous) {
     return report;
 }
 
-/* By path: what the client knows already. */
+/* The identifiers of the results that the client already has, by path. */
 std::map<std::string, json> results_before(const json &params) {
     std::map<std::string, json> known;
     const json *all = optional_member(params, "previousResultIds");

@@ -1,4 +1,4 @@
-/* pulling.h: answers clients that ask for findings. */
+/* pulling.h: answers clients that request findings. */
 #ifndef CDGEN_SERVER_PULLING_H
 #define CDGEN_SERVER_PULLING_H
 
@@ -6,9 +6,9 @@
 
 namespace lsp {
 
-/* Of one document, open or not. */
+/* The findings of one document, open or not. */
 json document_diagnostic(session &now, const json &params);
-/* Of all sources in the folders, once all have been looked at. */
+/* The findings of all sources in the folders; all are checked first. */
 json workspace_diagnostic(session &now, const json &params);
 
 } // namespace lsp

@@ -1,4 +1,4 @@
-/* rename.cpp: gives something another name, everywhere. */
+/* rename.cpp: renames an attribute, an action, an element or a variable class. */
 
 #include "server/rename.h"
 
@@ -17,7 +17,7 @@ using source_index::mention;
 using source_index::named;
 using source_index::names;
 
-/* The mention at a place if its name can be changed: a class's own name is for other programs. */
+/* The mention at a place if its name can be changed. Other programs use the name of the class. */
 const mention *renamable_at(const place_in_source &place) {
     const mention *here = place.in.names().at(place.offset);
     if (here == nullptr || place.in.names().all[here->name].kind == source_index::name_kind::resource_class)
@@ -30,20 +30,20 @@ struct replacement {
     std::string text;
 };
 
-/* Whether a whole value is the name, as opposed to a word of an expression. */
+/* Whether the name is the whole value of its line, not a word of an expression. */
 bool is_whole_value(document &in, const mention &each) {
     const source_index::attribute *line = in.index().attribute_at(in.index().line_at(each.at.begin));
     return line != nullptr && line->parts.value == each.at;
 }
 
-/* Whether a line with this text after the equals sign has the name as its value. */
+/* Whether this text after an equals sign means the name. */
 bool reads_as(std::string_view written, std::string_view name) {
     std::string line = "\ta=" + std::string(written);
     std::vector<source_index::line> read = source_index::lines_of(line);
     return read.size() == 1 && source_index::parts_of(line, read[0].text).value.of(line) == name;
 }
 
-/* How the name is written in the place of a mention, with quotes if it needs them. */
+/* The text that replaces a mention: the new name, with quotes if it needs them. */
 replacement written_at(document &in, const mention &each, std::string_view name) {
     const source_index::attribute *line = in.index().attribute_at(in.index().line_at(each.at.begin));
     if (!is_whole_value(in, each) || line->parts.quoted || reads_as(name, name))
@@ -61,7 +61,7 @@ std::string replaced(const std::string &text, const std::vector<replacement> &al
     return made.append(text, done);
 }
 
-/* Whether two sources use their names in the same way: which mentions have one name did not change. */
+/* Whether mentions that had the same name in one source have the same name in the other, and no others. */
 bool have_same_structure(const names &before, const names &after) {
     std::map<std::size_t, std::size_t> partner;
     std::map<std::size_t, std::size_t> taken;
@@ -76,7 +76,7 @@ bool have_same_structure(const names &before, const names &after) {
     return same;
 }
 
-/* The first finding of which there are more than before; null: there is none. */
+/* The first finding whose code occurs more often than before; null: there is none. */
 const check::finding *new_finding(const std::vector<check::finding> &before, const std::vector<check::finding> &after) {
     std::map<std::string_view, int> known;
     for (const check::finding &each : before)

@@ -8,7 +8,7 @@ namespace lsp {
 
 namespace {
 
-/* The deepest nesting of a text that may be JSON. */
+/* How deeply objects and lists are nested in a text, which need not be JSON. */
 std::size_t nesting_of(std::string_view text) {
     std::size_t depth = 0;
     std::size_t most = 0;

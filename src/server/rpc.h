@@ -1,4 +1,4 @@
-/* rpc.h: requests, notifications and responses as JSON, and what can be wrong with them. */
+/* rpc.h: requests, notifications and responses as JSON, and their errors. */
 #ifndef CDGEN_SERVER_RPC_H
 #define CDGEN_SERVER_RPC_H
 
@@ -34,10 +34,10 @@ struct request_error : std::runtime_error {
 
 constexpr std::size_t NESTING_MAX = 128; /* levels of objects and lists in a message */
 
-/* The message in a body. Throws request_error if it is not JSON, or too deep. */
+/* The message in a body. Throws request_error if it is not JSON, or is nested too deeply. */
 json parsed(std::string_view body);
 
-/* A message as bytes. What is not UTF-8 in a text of a source becomes U+FFFD. */
+/* A message as bytes. Bytes of a source that are not UTF-8 become U+FFFD. */
 std::string written(const json &message);
 
 /* Whether a value may identify a request. */
@@ -48,14 +48,14 @@ json error_response(const json &id, error_code code, std::string_view text);
 json notification(std::string_view method, json params);
 json request(const json &id, std::string_view method, json params);
 
-/* ---- Members of what a client sends. They throw request_error if a member is missing or of another type. */
+/* ---- Members of messages. These functions throw request_error if a member is missing or has another type. */
 
 const json &member(const json &of, const char *name);
 std::string text_member(const json &of, const char *name);
 int number_member(const json &of, const char *name);
-/* The same for members that may be missing; null is missing, too. */
+/* The same for optional members; null counts as missing. */
 const json *optional_member(const json &of, const char *name);
-/* A member of a member of ... that may be missing: a path such as "/a/b". True if it is true. */
+/* Whether the member at a path such as "/a/b" exists and is true. */
 bool is_true(const json &of, const char *path);
 
 position position_from(const json &value);

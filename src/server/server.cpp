@@ -65,7 +65,7 @@ constexpr std::array notifications = {
     notification_row{"window/workDoneProgress/cancel", did_cancel_progress},
 };
 
-/* What the server offers to a client. */
+/* The capabilities of the server. */
 json offers_to(const client_abilities &client) {
     constexpr int INCREMENTAL = 2;
     json offers = {
@@ -166,7 +166,7 @@ void server::work() {
     handle(message);
 }
 
-/* When everything has been looked at, a client that asks for findings is told to ask again. */
+/* When all work is done, tells a client that requests findings to request them again. */
 void server::finish_step() {
     publish_problems(now);
     if (now.asks_again && !has_work()) {
@@ -237,7 +237,7 @@ json server::initialize(const json &params) {
             {"serverInfo", {{"name", "cdef"}, {"version", now.world.version}}}};
 }
 
-/* What is wrong with a notification nobody is told: there is no answer to it. */
+/* A notification has no answer, so an error in one is only logged. */
 void server::handle_notification(const json &message) {
     const std::string method = message.at("method").get<std::string>();
     if (method == "exit") {

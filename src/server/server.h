@@ -1,4 +1,4 @@
-/* server.h: the language server: messages in, messages out. It knows no process and no terminal. */
+/* server.h: the language server: messages in, messages out. Knows neither processes nor terminals. */
 #ifndef CDGEN_SERVER_SERVER_H
 #define CDGEN_SERVER_SERVER_H
 
@@ -17,26 +17,26 @@ class server {
 public:
     explicit server(surroundings world) : now(std::move(world)) {}
 
-    /* Takes a message; it waits until work() comes to it. A cancellation is for those that wait. */
+    /* Queues a message for work(). A cancellation is carried out at once, on the messages in the queue. */
     void receive(const frame &message);
 
     bool has_work() const;
-    /* Whether so much waits that it is time to work before more is received. */
+    /* Whether the queue is full: call work() before the next receive(). */
     bool is_full() const {
         return waiting.size() >= WAITING_MAX || waiting_bytes >= BODY_MAX;
     }
-    /* Does one step: the message that has waited longest; without one, what a change of a document has left to do.
-     * There must be work. */
+    /* Does one step: handles the oldest message or, if there is none, checks a document that has changed. There must be
+     * work. */
     void work();
 
     /* Messages for the client, oldest first, without their headers. */
     std::vector<std::string> take_output();
 
-    /* Set when the client has asked the server to end, or when nothing more can be understood. */
+    /* Set when the client has ended the server, or when its messages can no longer be understood. */
     std::optional<int> exit_status() const {
         return status;
     }
-    /* The process that started the server, if the client has said so. */
+    /* The process that started the server, if the client has named it. */
     std::optional<int> client_process() const {
         return process;
     }
@@ -67,7 +67,7 @@ private:
     std::size_t waiting_bytes = 0;
     std::optional<int> status;
     std::optional<int> process;
-    std::vector<std::string> folders; /* that the client begins with */
+    std::vector<std::string> folders; /* of the initialize request */
 };
 
 } // namespace lsp

@@ -1,4 +1,4 @@
-/* session.cpp: what the features of the server share. */
+/* session.cpp: state that the features of the server share. */
 
 #include "server/session.h"
 
@@ -10,7 +10,7 @@ namespace lsp {
 
 namespace {
 
-/* UTF-8 if the client takes it: it is how sources are stored. */
+/* UTF-8 if the client supports it, because sources are stored in it. */
 encoding units_in(const json &capabilities) {
     const json::json_pointer path("/general/positionEncodings");
     if (!capabilities.contains(path) || !capabilities.at(path).is_array())

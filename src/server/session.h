@@ -1,4 +1,4 @@
-/* session.h: what the features of the server share: the client, its documents, and what is to be sent to it. */
+/* session.h: state that the features of the server share: the client, its documents, and the messages for it. */
 #ifndef CDGEN_SERVER_SESSION_H
 #define CDGEN_SERVER_SESSION_H
 
@@ -18,7 +18,7 @@
 
 namespace lsp {
 
-/* A message of a class. All are written as in the source. */
+/* The number of a message of a class. All texts are as written in the source. */
 struct message_number {
     std::string uri;     /* the source's */
     std::string catalog; /* its MessageCatalog */
@@ -26,32 +26,32 @@ struct message_number {
     std::string number;
 };
 
-/* What the server needs of the machine. */
+/* The functions and settings that the server gets from the program. */
 struct surroundings {
     /* The bytes of a file; nothing if it cannot be read. */
     std::function<std::optional<std::string>(const std::string &path)> read;
     /* The sources in a folder and the folders in it, as paths, in order. */
     std::function<std::vector<std::string>(const std::string &folder)> sources_in;
-    std::string explanations;                     /* where the page about all codes is, a URI; empty: nowhere */
+    std::string explanations;                     /* URI of the page that explains the codes; empty: there is none */
     std::string version;                          /* of the program */
-    std::optional<std::string> project_file = {}; /* read in place of all others; empty: none is read */
-    /* The text of a message. Empty as long as nothing reads catalogs. */
+    std::optional<std::string> project_file = {}; /* read instead of all others; empty: none is read */
+    /* The text of a message. Not set, because nothing reads catalogs yet. */
     std::function<std::optional<std::string>(const message_number &)> message_text = {};
 };
 
-/* What the client has said of itself. */
+/* The capabilities of the client. */
 struct client_abilities {
     encoding units = encoding::utf16;
-    bool relates = false;   /* shows places that are related to a finding */
-    bool links = false;     /* follows links of codes */
-    bool pulls = false;     /* asks for diagnostics itself */
-    bool refreshes = false; /* can be asked to ask again */
+    bool relates = false;   /* shows related places of a diagnostic */
+    bool links = false;     /* shows links of codes */
+    bool pulls = false;     /* requests diagnostics itself */
+    bool refreshes = false; /* can be told to request diagnostics again */
     bool watches_files = false;
     bool shows_progress = false;
     bool versioned_edits = false;
     bool snippets = false;
     bool nested_symbols = false;
-    bool literal_actions = false; /* takes code actions, not just commands */
+    bool literal_actions = false; /* supports code actions, not only commands */
 };
 
 client_abilities abilities_in(const json &initialize);
@@ -83,8 +83,8 @@ struct session {
     std::map<std::string, document> open; /* by key_of their URIs */
     std::set<std::string> unpublished;    /* keys of open documents that changed since their findings were sent */
     std::vector<std::string> outbox;
-    unsigned asked = 0;      /* requests of the server */
-    bool asks_again = false; /* the client is to ask for findings again */
+    unsigned asked = 0;      /* number of requests that the server has sent */
+    bool asks_again = false; /* true: the client has to be told to request findings again */
 };
 
 } // namespace lsp

@@ -52,7 +52,7 @@ const source_index::attribute *name_of(const stanza &of) {
     return nullptr;
 }
 
-/* An outline in the making. Symbols come in the order of the source. */
+/* Builds an outline, in the order of the source. */
 class outline {
 public:
     outline(document &of, encoding units) : in(of), positions(of.positions(units)) {}
@@ -97,10 +97,10 @@ private:
 
     document &in;
     position_maker positions;
-    std::map<std::size_t, std::vector<std::size_t>> children; /* by owner; NONE: on top */
+    std::map<std::size_t, std::vector<std::size_t>> children; /* by owner; NONE: at the top level */
 };
 
-/* The same symbols, one after the other. */
+/* The same symbols as a flat list. */
 void flatten(const json &nested, const std::string &uri, const std::string &container, json &to) {
     for (const json &each : nested) {
         json symbol = {{"name", each.at("name")},

@@ -8,7 +8,7 @@ namespace lsp {
 
 json document_symbols(session &now, const json &params);
 
-/* Names of a document that contain a text in any case, with their places. units: of the places */
+/* The names in a document that contain a text, in upper or lower case, with their places. units: of these places */
 json symbols_called(document &in, std::string_view query, encoding units);
 
 } // namespace lsp

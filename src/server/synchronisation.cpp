@@ -1,4 +1,4 @@
-/* synchronisation.cpp: documents follow the editor. */
+/* synchronisation.cpp: keeps documents in step with the editor. */
 
 #include "server/synchronisation.h"
 
@@ -9,7 +9,7 @@ namespace lsp {
 
 namespace {
 
-/* What the disk has of it, or had, may count anew. */
+/* Checks the file of a document again if it belongs to a folder. */
 void look_at_file(session &now, const std::string &key) {
     if (now.sources.holds(key) || (now.sources.is_in_folder(key) && key.ends_with(".cdefsrc")))
         now.sources.look_at(key);

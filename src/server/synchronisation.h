@@ -1,4 +1,4 @@
-/* synchronisation.h: documents follow the editor, and their findings follow the documents. */
+/* synchronisation.h: keeps documents and their findings in step with the editor. */
 #ifndef CDGEN_SERVER_SYNCHRONISATION_H
 #define CDGEN_SERVER_SYNCHRONISATION_H
 
@@ -10,7 +10,7 @@ void did_open(session &now, const json &params);
 void did_change(session &now, const json &params);
 void did_close(session &now, const json &params);
 
-/* Sends the findings of one document that has changed; there must be one. A client that asks for them gets none. */
+/* Sends the findings of one changed document; there must be one. A client that requests findings itself gets none. */
 void publish_next(session &now);
 
 } // namespace lsp

@@ -1,4 +1,4 @@
-/* tokens.cpp: what each part of a document is. */
+/* tokens.cpp: semantic tokens. */
 
 #include "server/tokens.h"
 
@@ -95,7 +95,7 @@ void add_line(token_writer &to, document &in, std::size_t number) {
     add_comment(to, in.text(), line);
 }
 
-/* The lines that have bytes of a stretch. */
+/* The tokens of all lines that overlap a stretch. */
 json tokens_in(session &now, document &in, const stretch &part) {
     token_writer written(in, now.client.units);
     const std::vector<source_index::line> &lines = in.index().lines;

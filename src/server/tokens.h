@@ -1,4 +1,4 @@
-/* tokens.h: what each part of a document is, for colours. */
+/* tokens.h: semantic tokens, which editors show in colours. */
 #ifndef CDGEN_SERVER_TOKENS_H
 #define CDGEN_SERVER_TOKENS_H
 
@@ -6,7 +6,7 @@
 
 namespace lsp {
 
-/* The names of types and modifiers, to which the numbers in tokens refer. */
+/* The names that the numbers in tokens stand for. */
 json token_legend();
 
 json semantic_tokens(session &now, const json &params);

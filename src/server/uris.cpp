@@ -9,7 +9,7 @@ namespace lsp {
 
 namespace {
 
-/* With its escapes, such as %20, replaced. Nothing if one is wrong, or means a zero byte. */
+/* Replaces escapes such as %20. Nothing if one is malformed or stands for a zero byte. */
 std::optional<std::string> unescaped(std::string_view text) {
     std::string plain;
     constexpr std::size_t DIGITS = 2;

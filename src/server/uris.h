@@ -8,10 +8,11 @@
 
 namespace lsp {
 
-/* The path of a URI such as file:///a/b%20c; nothing for other schemes, other hosts, and what cannot be a path. */
+/* The path of a URI such as file:///a/b%20c; nothing for other schemes, for other hosts, and for paths that cannot
+ * exist. */
 std::optional<std::string> path_of(std::string_view uri);
 
-/* The same document has the same key, however its URI is escaped: the path; for other schemes the URI. */
+/* A document's key, which does not depend on how its URI is escaped: its path or, for other schemes, its URI. */
 std::string key_of(const std::string &uri);
 
 } // namespace lsp

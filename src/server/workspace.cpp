@@ -79,7 +79,7 @@ void workspace::step(session &now) {
     report_progress(now);
 }
 
-/* Facts are only needed where there are several classes. */
+/* Facts are needed only if there are several classes. */
 void workspace::check(session &now, const std::string &path) {
     auto open = now.open.find(path);
     std::optional<std::string> text = open == now.open.end() ? now.world.read(path) : std::nullopt;
@@ -124,7 +124,7 @@ void workspace::ask_for_progress(session &now) {
         progress_request = now.ask("window/workDoneProgress/create", {{"token", PROGRESS}});
 }
 
-/* The sources may all have been looked at already: then the progress ends at once. */
+/* If all sources have been checked meanwhile, the progress ends at once. */
 void workspace::take_answer(session &now, const std::string &id, bool agreed) {
     if (id != progress_request)
         return;
@@ -139,7 +139,7 @@ void workspace::take_answer(session &now, const std::string &id, bool agreed) {
 }
 
 void workspace::report_progress(session &now) {
-    constexpr std::size_t REPORTED = 64; /* a report for so many sources */
+    constexpr std::size_t REPORTED = 64; /* sources between two reports */
     if (!in_progress || (!waiting.empty() && waiting.size() % REPORTED != 0))
         return;
     json value = {{"kind", "end"}};

@@ -19,9 +19,8 @@ struct session;
 
 /* A source in a folder. */
 struct workspace_file {
-    std::vector<check::finding>
-        own; /* what is wrong with it as it is stored. Of an open document that counts instead */
-    std::vector<check::finding> across;      /* what contradicts other classes */
+    std::vector<check::finding> own;         /* of the file; not used while the document is open */
+    std::vector<check::finding> across;      /* conflicts with other classes */
     std::optional<build::class_facts> facts; /* none: it has errors, or has not been checked yet */
 };
 
@@ -34,16 +33,16 @@ public:
     bool holds(const std::string &path) const {
         return known.contains(path);
     }
-    /* What contradicts other classes in a source; nothing in one that is in no folder. */
+    /* A source's conflicts with other classes; none if it is outside the folders. */
     std::vector<check::finding> across(const std::string &path) const {
         auto found = known.find(path);
         return found == known.end() ? std::vector<check::finding>() : found->second.across;
     }
 
-    /* Folders come and go; their sources are looked at step by step. */
+    /* The sources of a new folder are checked step by step. */
     void add_folder(session &now, const std::string &path);
     void remove_folder(session &now, const std::string &path);
-    /* A source in a folder has changed, in the editor or on the disk, has come or has gone. */
+    /* Call this when a source in a folder has changed, in the editor or on the disk, or was created or removed. */
     void look_at(const std::string &path) {
         waiting.insert(path);
     }
@@ -53,10 +52,10 @@ public:
     bool has_work() const {
         return !waiting.empty() || uncompared;
     }
-    /* Looks at one source, or compares all. */
+    /* Checks one source or, when all are checked, compares them. */
     void step(session &now);
 
-    /* The client does not want to wait for the rest of the first look. */
+    /* Ends the first check early, as the user wishes. */
     void stop_scan(session &now);
 
     /* The client has answered a request. Progress is only reported after it has agreed to show it. */
@@ -70,11 +69,11 @@ private:
 
     std::set<std::string> folders; /* each with a slash at its end */
     std::map<std::string, workspace_file> known;
-    std::set<std::string> waiting; /* sources to be looked at */
+    std::set<std::string> waiting; /* sources that have to be checked */
     bool uncompared = false;       /* facts have changed since the classes were compared */
     std::string progress_request;  /* asks whether the client shows progress; empty: answered, or not asked */
-    bool in_progress = false;      /* the client has been told of a first look that has not ended */
-    std::size_t scan_size = 0;     /* sources of the first look */
+    bool in_progress = false;      /* true: the client shows the progress of the first check */
+    std::size_t scan_size = 0;     /* number of sources in the first check */
 };
 
 } // namespace lsp

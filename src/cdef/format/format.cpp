@@ -28,17 +28,17 @@ namespace {
 struct format_options {
     std::vector<std::string> sources;
     bool in_place = false;
-    bool checks = false; /* only names what would change */
-    bool diffs = false;  /* only shows what would change */
+    bool checks = false; /* only lists the sources that would change */
+    bool diffs = false;  /* only shows the changes */
     bool reorder = false;
 };
 
-/* A text that is to be read by programs, too. */
+/* The name is masked only on a terminal: programs need it unchanged. */
 std::string name_line(const std::string &source) {
     return (isatty(STDOUT_FILENO) == 0 ? source : text::masked(source)) + "\n";
 }
 
-/* Writes what is wanted of a formatted source; whether the source was as it should be. */
+/* Writes the source, its name or its changes. Returns false if a check found changes. */
 bool write(const std::string &source, const std::string &before, const std::string &after,
            const format_options &options) {
     bool same = before == after;

@@ -9,14 +9,14 @@
 
 namespace cdef {
 
-/* The bytes of a regular file of a reasonable size; nothing if there is none, or if it cannot be read. */
+/* The bytes of a file; nothing if it cannot be read, is not a regular file, or has more than 64 MiB. */
 std::optional<std::string> bytes_of_file(const std::string &path);
 
 /* The sources in a folder and in the folders below it, in order. Links to folders are not followed, and hidden folders
  * are left out. The search ends early in a folder with very many files, such as the root of a file system. */
 std::vector<std::string> sources_below(const std::string &folder);
 
-/* The page with the explanations of all codes, as a URI: where it is installed beside the program, or empty. */
+/* URI of the installed page that explains the codes; empty if it is not installed. */
 std::string explanations_page();
 
 } // namespace cdef

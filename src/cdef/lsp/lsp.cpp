@@ -1,4 +1,4 @@
-/* lsp.cpp: the subcommand that serves editors: standard input and output carry the messages. */
+/* lsp.cpp: the subcommand that serves editors over standard input and output. */
 
 #include "cdef/cdef.h"
 #include "cdef/lsp/files.h"
@@ -25,7 +25,7 @@ namespace cdef {
 namespace {
 
 struct lsp_options {
-    bool standard_streams = false; /* accepted, since clients pass it; there is no other way */
+    bool standard_streams = false; /* ignored: clients pass it, and there is no other way */
     std::string explanations;
     project_options project;
 };
@@ -53,13 +53,13 @@ private:
     bool ended = false; /* the input */
 };
 
-/* Whether input can be read, or has ended, within this time; -1: however long it takes. */
+/* Waits this long at most for input or its end; -1: for ever. Returns whether there is any. */
 bool connection::is_ready(int milliseconds) const {
     pollfd input = {STDIN_FILENO, POLLIN, 0};
     return !ended && poll(&input, 1, milliseconds) > 0;
 }
 
-/* Whether there was input. */
+/* Returns false at the end of the input. */
 bool connection::read_some() {
     std::array<char, 65536> buffer;
     ssize_t size = read(STDIN_FILENO, buffer.data(), buffer.size());
@@ -87,7 +87,7 @@ bool connection::client_is_gone() const {
     return process && *process > 0 && kill(*process, 0) != 0 && errno == ESRCH;
 }
 
-/* All that has arrived is received before the next step is done, so that a cancellation comes in time. Returns the
+/* Receives everything that has arrived before the next step, so that a cancellation comes in time. Returns the
  * program's status. */
 int connection::serve() {
     constexpr int LOOK_AFTER_CLIENT = 3000; /* milliseconds */

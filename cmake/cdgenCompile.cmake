@@ -11,10 +11,11 @@
 #   WERROR        a source with warnings makes no database
 #   GATE          a source that breaks those who rely on an older version makes no database either. BASELINE is that
 #                 version as "cdef gate" takes it: a file, a directory, or git:REVISION[:PATH]; relative paths count from
-#                 the current source directory. cdef.toml chooses the level, and the file of numbers
+#                 the current source directory. cdef.toml chooses the level, and the file of numbers, which is ids.lock
+#                 beside cdef.toml, or beside the source, if left out
 #
-# The database is built again when the source, its cdef.toml, the older version or cdef has changed. If the source has
-# errors, the old database stays.
+# The database is built again when the source, its cdef.toml, ids.lock, the older version or cdef has changed. If the
+# source has errors, the old database stays.
 
 # The project file that cdef finds for a source; empty if there is none.
 function(cdgen_project_file SOURCE variable)
@@ -66,12 +67,20 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
     list(APPEND options --werror)
   endif()
 
-  cdgen_project_file("${SOURCE}" depends)
+  cdgen_project_file("${SOURCE}" project)
+  set(depends ${project})
   set(gate "")
   if(DEFINED arg_GATE)
     if(NOT arg_GATE MATCHES "^git:")
       cmake_path(ABSOLUTE_PATH arg_GATE BASE_DIRECTORY "${CMAKE_CURRENT_SOURCE_DIR}" NORMALIZE)
       list(APPEND depends "${arg_GATE}")
+    endif()
+    cmake_path(GET project PARENT_PATH beside)
+    if(NOT project)
+      cmake_path(GET SOURCE PARENT_PATH beside)
+    endif()
+    if(EXISTS "${beside}/ids.lock")
+      list(APPEND depends "${beside}/ids.lock")
     endif()
     set(strict "")
     if(arg_WERROR)

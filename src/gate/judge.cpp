@@ -4,6 +4,7 @@
 
 #include "compare/describe.h"
 #include "gate/places.h"
+#include "text/shown.h"
 
 #include <string>
 #include <utility>
@@ -22,6 +23,12 @@ check::finding finding_of(const compare::breach_rule &rule, std::string text, lo
 }
 
 } // namespace
+
+check::finding without_class(std::string_view name) {
+    std::string text("- ");
+    text.append(compare::row_of(compare::node_kind::resource_class).text).append(" ").append(text::quoted_ascii(name));
+    return finding_of(compare::rule_of(compare::breach::GONE), std::move(text), {});
+}
 
 std::vector<check::finding> judge(const versions &of, compare::level up_to) {
     std::vector<check::finding> all;

@@ -21,6 +21,9 @@ struct versions {
  * others. Throws compare::too_entangled. */
 std::vector<check::finding> judge(const versions &of, compare::level up_to);
 
+/* The finding that the newer version of a database no longer has a class. */
+check::finding without_class(std::string_view name);
+
 } // namespace gate
 
 #endif

@@ -127,6 +127,21 @@ class Compile:
         self.build()
         self.assertNotEqual(self.made("a.cdef"), before)
 
+    def test_gate_reads_the_numbers_beside_the_source(self):
+        """Not those of the build directory, where it runs."""
+        ids = self.here / "ids.lock"
+        ids.write_text("Disk\tPersistentResourceAttribute\t1\tString\tOther\n")
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef GATE a.cdefsrc)", a=disk().read_bytes())
+        with self.assertRaises(AssertionError) as failed:
+            self.build()
+        self.assertRegex(str(failed.exception), r"a\.cdefsrc:\d+:\d+: error: .*\[CMP401\]")
+        ids.write_text(ids.read_text().replace("Other", "SerialNumber"))
+        self.build()
+        ids.write_text(ids.read_text().replace("SerialNumber", "Other"))
+        later(ids)
+        with self.assertRaises(AssertionError):
+            self.build()
+
     def test_project_file_builds_again(self):
         (self.here / "cdef.toml").write_text("")
         odd = disk().read_bytes().replace(b"Id=1\n", b"Id=010\n")

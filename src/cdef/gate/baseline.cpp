@@ -2,11 +2,11 @@
 
 #include "cdef/gate/baseline.h"
 
-#include "build/plan.h"
 #include "cdb_view.h"
 #include "cdef/gate/git.h"
 #include "cdef/support/failure.h"
 
+#include <algorithm>
 #include <cstring>
 #include <filesystem>
 #include <string_view>
@@ -45,13 +45,50 @@ std::string line_of(std::string output) {
     return without(std::move(output), "\n");
 }
 
-} // namespace
+std::string without_dots(const fs::path &path) {
+    return path.lexically_normal().string();
+}
 
-std::vector<std::string> names_for(const std::string &path) {
+/* True if a file or one of the directories that lead to it is hidden. */
+bool is_hidden(const fs::path &below) {
+    return std::any_of(below.begin(), below.end(), [](const fs::path &part) { return part.string().starts_with('.'); });
+}
+
+bool is_source(std::string_view name) {
+    return name.ends_with(".cdefsrc");
+}
+
+std::vector<std::string> files_in(const std::string &directory) {
+    std::vector<std::string> names;
+    try {
+        for (const fs::directory_entry &each : fs::directory_iterator(directory))
+            if (each.is_regular_file())
+                names.push_back(each.path().filename().string());
+    } catch (const fs::filesystem_error &e) {
+        throw failure(directory + ": " + e.code().message());
+    }
+    std::sort(names.begin(), names.end());
+    return names;
+}
+
+/* Texts that git has put a zero byte after. */
+std::vector<std::string> texts_in(std::string_view output) {
+    std::vector<std::string> texts;
+    for (std::size_t end = output.find('\0'); end != output.npos; end = output.find('\0')) {
+        texts.emplace_back(output.substr(0, end));
+        output.remove_prefix(end + 1);
+    }
+    return texts;
+}
+
+/* The names, without directory, that an older version of a file may have, the likeliest one first. */
+std::vector<std::string> names_of(const std::string &path) {
     std::string own = fs::path(path).filename().string();
     std::string stem = without(without(own, "src"), ".cdef");
     return {stem + ".cdef", stem + ".le.cdef", stem + ".be.cdef", stem + ".cdefsrc", own};
 }
+
+} // namespace
 
 baseline::baseline(std::string wanted) : kind(kinds::FILE), place(std::move(wanted)) {
     if (place.starts_with(GIT)) {
@@ -80,7 +117,7 @@ std::optional<older_version> baseline::version_of(const std::string &path) const
 
 std::optional<older_version> baseline::in_directory(const std::string &path) const {
     std::error_code error;
-    for (const std::string &name : names_for(path))
+    for (const std::string &name : names_of(path))
         if (fs::path file = fs::path(place) / name; fs::is_regular_file(file, error))
             return version_in(file.string());
     return std::nullopt;
@@ -94,7 +131,7 @@ std::optional<older_version> baseline::in_revision(const std::string &path) cons
     if (kind == kinds::REVISION) {
         candidates.push_back("./" + fs::path(path).filename().string());
     } else if (line_of(git(directory, {"cat-file", "-t", revision + ":" + place}).value_or("")) == "tree") {
-        for (const std::string &name : names_for(path))
+        for (const std::string &name : names_of(path))
             candidates.push_back(place + (place.empty() || place.ends_with('/') ? "" : "/") + name);
     } else {
         candidates.push_back(place);
@@ -105,6 +142,67 @@ std::optional<older_version> baseline::in_revision(const std::string &path) cons
     if (kind == kinds::REVISION_PATH && candidates.front() == place)
         throw failure("git:" + revision + ":" + place + ": no such file or directory at that revision");
     return std::nullopt;
+}
+
+/* Below the directory, with a slash; for a path at a revision or another directory, directly in that. */
+std::vector<std::string> baseline::names_for(const std::string &directory) const {
+    switch (kind) {
+    case kinds::FILE:
+        return {};
+    case kinds::DIRECTORY:
+        return files_in(place);
+    case kinds::REVISION:
+        return texts_in(git(directory, {"ls-tree", "-z", "-r", "--name-only", revision}).value_or(""));
+    case kinds::REVISION_PATH: /* git fails if that is a file */
+        return texts_in(
+            git(directory, {"ls-tree", "-z", "--name-only", "--full-tree", revision + ":" + place}).value_or(""));
+    }
+    return {};
+}
+
+older_file baseline::older_file_of(const std::string &name, const std::string &directory) const {
+    std::string now = without_dots(fs::path(directory) / name);
+    std::string key = kind == kinds::REVISION || is_relative() ? now : name;
+    if (kind == kinds::DIRECTORY) {
+        std::string file = (fs::path(place) / name).string();
+        return {file, file, key, directory};
+    }
+    std::string beginning = kind == kinds::REVISION                 ? "./"
+                            : place.empty() || place.ends_with('/') ? place
+                                                                    : place + "/";
+    return {GIT.data() + revision + ":" + beginning + name, now, key, directory};
+}
+
+std::set<std::string> baseline::keys_of(const std::string &path) const {
+    if (kind == kinds::REVISION)
+        return {without_dots(path)};
+    std::set<std::string> keys;
+    for (const std::string &name : names_of(path))
+        keys.insert(is_relative() ? without_dots(fs::path(path).parent_path() / name) : name);
+    return keys;
+}
+
+std::vector<older_file> baseline::files_for(const std::string &directory,
+                                            const std::vector<std::string> &sources) const {
+    std::set<std::string> directories = {directory};
+    if (is_relative())
+        for (const std::string &source : sources)
+            directories.insert(fs::path(source).parent_path().string());
+    std::vector<older_file> files;
+    for (const std::string &each : directories)
+        for (const std::string &name : names_for(each))
+            if (!is_hidden(name) && (is_source(name) || (kind != kinds::REVISION && name.ends_with(".cdef"))))
+                files.push_back(older_file_of(name, each));
+    return files;
+}
+
+older_version baseline::read(const older_file &file) const {
+    if (kind == kinds::DIRECTORY)
+        return version_in(file.name);
+    std::optional<std::string> text = git(file.directory, {"cat-file", "blob", file.name.substr(GIT.size())});
+    if (!text)
+        throw failure(file.name + ": not a file");
+    return {file.name, bytes_of(*text)};
 }
 
 } // namespace cdef::gate_command

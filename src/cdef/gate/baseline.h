@@ -3,8 +3,8 @@
 #define CDGEN_CDEF_GATE_BASELINE_H
 
 #include <cstddef>
-#include <functional>
 #include <optional>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -14,6 +14,14 @@ namespace cdef::gate_command {
 struct older_version {
     std::string name; /* for messages */
     std::vector<std::byte> bytes;
+};
+
+/* A file that the older version of a directory has. */
+struct older_file {
+    std::string name;      /* for messages */
+    std::string path;      /* for findings: where the file is or, if it is in a revision, where it would be now */
+    std::string key;       /* see keys_of */
+    std::string directory; /* that the older version is of */
 };
 
 class baseline {
@@ -29,19 +37,30 @@ public:
     /* The older version of a source or a database; nothing if there is none. Throws failure. */
     std::optional<older_version> version_of(const std::string &path) const;
 
+    /* The sources and databases in the older version of a directory, except hidden ones. sources: those that are in the
+     * directory now, which say where relative paths lead. Throws failure. */
+    std::vector<older_file> files_for(const std::string &directory, const std::vector<std::string> &sources) const;
+    /* The older version of a class is a file with one of these keys. */
+    std::set<std::string> keys_of(const std::string &path) const;
+    /* Throws failure. */
+    older_version read(const older_file &file) const;
+
 private:
     enum class kinds { FILE, DIRECTORY, REVISION, REVISION_PATH };
 
     std::optional<older_version> in_directory(const std::string &path) const;
     std::optional<older_version> in_revision(const std::string &path) const;
+    std::vector<std::string> names_for(const std::string &directory) const;
+    older_file older_file_of(const std::string &name, const std::string &directory) const;
+    /* True if the path at the revision begins at the directory of each class. */
+    bool is_relative() const {
+        return kind == kinds::REVISION_PATH && (place == "." || place.starts_with("./"));
+    }
 
     kinds kind;
     std::string place;    /* the file, the directory, or the path at the revision */
     std::string revision; /* empty: none */
 };
-
-/* The names, without directory, that an older version of a file may have, the likeliest one first. */
-std::vector<std::string> names_for(const std::string &path);
 
 } // namespace cdef::gate_command
 

@@ -2,11 +2,12 @@
 
 #include "cdef/cdef.h"
 #include "cdef/gate/baseline.h"
+#include "cdef/gate/former.h"
 #include "cdef/gate/ids_file.h"
+#include "cdef/gate/version.h"
 #include "cdef/support/command.h"
 #include "cdef/support/failure.h"
 #include "cdef/support/finding_options.h"
-#include "cdef/support/input.h"
 #include "cdef/support/sources.h"
 #include "cdef/support/text_of_file.h"
 #include "compare/writer.h"
@@ -14,17 +15,25 @@
 #include "gate/judge.h"
 
 #include <algorithm>
+#include <filesystem>
 #include <map>
 #include <memory>
 #include <optional>
+#include <set>
+#include <utility>
 
 namespace cdef {
 
 namespace {
 
+namespace fs = std::filesystem;
 using gate_command::baseline;
+using gate_command::bytes_of;
 using gate_command::ids_file;
 using gate_command::older_version;
+using gate_command::stem_of;
+using gate_command::text_of;
+using gate_command::version;
 
 struct gate_options {
     std::vector<std::string> operands;
@@ -43,56 +52,16 @@ compare::level level_called(std::string_view name) {
     return compare::level::READERS;
 }
 
-/* A database in memory that can be relied on. */
-struct version {
-    version(const std::string &name, std::vector<std::byte> bytes)
-        : in(name, std::move(bytes)), owners(require_readable(in).owners) {}
-
-    compare::origin origin() const {
-        return {in.db, owners};
-    }
-
-    input in;
-    cdb::ownership owners;
-};
-
-std::vector<std::byte> bytes_of(std::string_view text) {
-    std::vector<std::byte> bytes(text.size());
-    std::copy(text.begin(), text.end(), reinterpret_cast<char *>(bytes.data()));
-    return bytes;
-}
-
-std::string_view text_of(const std::vector<std::byte> &bytes) {
-    return {reinterpret_cast<const char *>(bytes.data()), bytes.size()};
-}
-
-/* "Disk" for "old/Disk.le.cdef". */
-std::string stem_of(const std::string &path) {
-    std::string name = path.substr(path.rfind('/') + 1);
-    return name.substr(0, name.find(".cdef"));
-}
-
 /* The name of a class without one. It is called after its database, whose directory is not known here; so it has the
  * older version's name if that is called after its own file. */
 std::string class_name_for(const std::string &path, const version *before) {
     std::string own = stem_of(path);
     if (before == nullptr)
         return own;
-    std::string name;
-    for (const auto &each : before->in.db.classes())
-        name = each.name();
+    std::vector<std::string> names = before->class_names();
+    std::string name = names.empty() ? "" : names.back();
     std::string older = stem_of(name);
     return older == own || older == stem_of(before->in.name) ? name : own;
-}
-
-/* The older version as a database. A source is compiled; it may not have errors. */
-std::unique_ptr<version> readable(older_version &&old) {
-    if (!is_text(old.bytes))
-        return std::make_unique<version>(old.name, std::move(old.bytes));
-    gate::compiled made = gate::compile(text_of(old.bytes), old.name, stem_of(old.name));
-    if (!made.findings.empty())
-        throw failure(old.name + ": not a source that compiles; 'cdef check' says why");
-    return std::make_unique<version>(old.name, std::move(made.image));
 }
 
 /* The rules that findings of this subcommand may break. */
@@ -106,6 +75,11 @@ std::vector<report::rule> rules() {
     return all;
 }
 
+/* Numbers are recorded beside the project file; without one, beside the source. */
+std::string default_ids(const std::string &source, const config::settings &settings) {
+    return (fs::path(settings.path.empty() ? source : settings.path).parent_path() / "ids.lock").string();
+}
+
 /* One run of the subcommand. */
 class gate_run {
 public:
@@ -117,15 +91,18 @@ public:
 private:
     struct operand {
         std::string path;
+        std::string directory; /* that was given, and in which it is; empty: it was given itself */
         const config::settings &settings;
         const baseline *against; /* null: it is not compared */
         ids_file *ids;
     };
 
     std::vector<operand> operands();
+    void look_for_former(const std::vector<operand> &all);
     const baseline *baseline_for(const config::settings &settings);
-    ids_file *ids_for(const config::settings &settings);
+    ids_file *ids_for(const std::string &source, const config::settings &settings);
     void look_at(const operand &what, report::writer &form);
+    void report_former(report::writer &form);
     check::totals judge(const operand &what, report::writer &form);
     std::vector<check::finding> breaches(const operand &what, const version &now, const version *before,
                                          std::string_view source) const;
@@ -134,6 +111,8 @@ private:
     project_files projects;
     std::map<std::string, baseline> baselines; /* by what names them */
     std::map<std::string, ids_file> ids;       /* by path */
+    gate_command::former_files former;
+    std::set<std::string> classes; /* names of those that are there */
     bool pass = true;
     bool read = true;
 };
@@ -144,26 +123,44 @@ const baseline *gate_run::baseline_for(const config::settings &settings) {
 }
 
 /* A file that nobody has named need not exist. */
-ids_file *gate_run::ids_for(const config::settings &settings) {
+ids_file *gate_run::ids_for(const std::string &source, const config::settings &settings) {
     std::string path = options.ids.value_or(settings.ids);
     bool may_be_missing = options.update || path.empty();
     if (path.empty())
-        path = "ids.lock";
-    return &ids.try_emplace(path, path, may_be_missing).first->second;
+        path = default_ids(source, settings);
+    std::error_code error;
+    return &ids.try_emplace(fs::weakly_canonical(path, error).string(), path, may_be_missing).first->second;
 }
 
 std::vector<gate_run::operand> gate_run::operands() {
     std::vector<operand> all;
-    for (const std::string &path : sources_of(options.operands)) {
-        const config::settings &settings = projects.of(path);
-        all.push_back({path, settings, baseline_for(settings), ids_for(settings)});
-        const operand &last = all.back();
-        if (last.against == nullptr && !last.ids->exists() && !options.update)
-            throw failure(path + ": nothing to compare it with: name an older version with --against");
+    for (const std::string &given : options.operands) {
+        std::error_code error;
+        std::string directory = given != "-" && fs::is_directory(given, error) ? given : "";
+        for (const std::string &path : sources_of({given})) {
+            const config::settings &settings = projects.of(path);
+            all.push_back({path, directory, settings, baseline_for(settings), ids_for(path, settings)});
+            const operand &last = all.back();
+            if (last.against == nullptr && !last.ids->exists() && !options.update)
+                throw failure(path + ": nothing to compare it with: name an older version with --against");
+        }
     }
     if (all.size() > 1 && all.front().against != nullptr && all.front().against->is_one_file())
         throw failure("--against names one file, and there are " + std::to_string(all.size()) + " classes");
     return all;
+}
+
+/* Only a directory says that what is not in it is gone. */
+void gate_run::look_for_former(const std::vector<operand> &all) {
+    std::map<std::pair<std::string, const baseline *>, std::vector<std::string>> sources;
+    std::vector<std::string> paths;
+    for (const operand &each : all) {
+        paths.push_back(each.path);
+        if (!each.directory.empty() && each.against != nullptr)
+            sources[{each.directory, each.against}].push_back(each.path);
+    }
+    for (const auto &[where, there] : sources)
+        former.look_for(*where.second, where.first, there, paths);
 }
 
 /* What breaks, in the order of the lines. */
@@ -198,8 +195,13 @@ check::totals gate_run::judge(const operand &what, report::writer &form) {
     } else {
         source.clear();
     }
-    if (found.empty())
-        found = breaches(what, version(what.path, std::move(image)), before.get(), source);
+    if (found.empty()) {
+        version now(what.path, std::move(image));
+        for (std::string &name : now.class_names())
+            classes.insert(std::move(name));
+        bool is_new = what.against != nullptr && before == nullptr;
+        found = breaches(what, now, is_new ? former.last_of(*what.against, now) : before.get(), source);
+    }
     check::totals count;
     for (const check::finding &each : found) {
         form.add(each);
@@ -225,11 +227,36 @@ void gate_run::look_at(const operand &what, report::writer &form) {
     read = false;
 }
 
+/* Reports the classes that are gone, and the files that cannot be read. */
+void gate_run::report_former(report::writer &form) {
+    for (const gate_command::former_file &each : former.all()) {
+        check::totals count;
+        if (each.last == nullptr) {
+            form.begin_source(each.path);
+            options.findings.fail_source(form, each.problem);
+            read = false;
+            continue;
+        }
+        for (const std::string &name : each.last->class_names()) {
+            if (classes.contains(name))
+                continue;
+            if (count.errors++ == 0)
+                form.begin_source(each.path);
+            form.add(gate::without_class(name));
+        }
+        if (count.errors > 0)
+            form.end_source(count);
+        pass = pass && count.errors == 0;
+    }
+}
+
 int gate_run::run() {
     std::vector<operand> all = operands();
+    look_for_former(all);
     std::unique_ptr<report::writer> form = options.findings.writer(rules());
     for (const operand &each : all)
         look_at(each, *form);
+    report_former(*form);
     form->close();
     if (options.update)
         for (const auto &[path, file] : ids)
@@ -249,7 +276,8 @@ void add_gate(program &app) {
     made.add("--against", options->against, "The older version: a file, a directory, or git:REVISION[:PATH]");
     made.add("--level", options->level, "What relies on it; each level includes those before")
         .one_of({"readers", "clients", "stored"});
-    made.add("--ids", options->ids, "File of all numbers that have been in use; the default is ids.lock");
+    made.add("--ids", options->ids,
+             "File of all numbers that have been in use; the default is ids.lock beside cdef.toml or the source");
     made.add_flag("--update", options->update, "Record the numbers in that file, even those that contradict it");
     add_report_options(made, options->findings);
     add_project_rules(made, options->findings);

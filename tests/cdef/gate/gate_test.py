@@ -189,6 +189,90 @@ def test_takes_older_versions_from_git(world):
     check(codes(found(world, "--against=git:HEAD~1", "a.cdefsrc", cwd=world.path("classes"))[1]) == {"CMP102"}, "elsewhere")
 
 
+# ---- Classes that are gone -------------------------------------------------------------------------------------------
+
+A, B = (HEAD.replace(b"Name=Disk", name).replace(b"mgr1.cat", cat) for name, cat in
+        ((b"Name=A", b"a.cat"), (b"Name=B", b"b.cat")))
+
+
+def test_reports_a_class_that_is_gone(world):
+    """Once, on each level, if its directory is given; from a source or from a database, which has no suffix then."""
+    write(world, "new/a.cdefsrc", A)
+    write(world, "old/a.cdefsrc", A)
+    write(world, "old/b.cdefsrc", B)
+    write(world, "old/.hidden.cdefsrc", B)
+    write(world, "old/notes.txt", b"B")
+    for level in LEVELS:
+        expect(world.inspect("gate", "--level", level, "--against=old", "new"), 1,
+               b"old/b.cdefsrc: error: - ResourceClass 'B' (readers miss it) [CMP101]\n1 error and 0 warnings in 1 of 2 sources\n")
+    expect(world.inspect("gate", "--against=old", "new/a.cdefsrc"), 0)
+    expect(world.inspect("build", "-q", "--byte-order=both", "-d", "old", "old/b.cdefsrc"), 0)
+    world.path("old/b.cdefsrc").unlink()
+    world.path("old/b.le.cdef").unlink()
+    expect(world.inspect("gate", "--against=old", "new"), 1,
+           b"old/b.be.cdef: error: - ResourceClass 'B' (readers miss it) [CMP101]\n1 error and 0 warnings in 1 of 2 sources\n")
+    write(world, "other/b.cdefsrc", B)
+    expect(world.inspect("gate", "--against=old", "new", "other"), 0)
+    expect(world.inspect("gate", "--against=old", "new", "other/b.cdefsrc"), 0)
+
+
+@pytest.mark.parametrize("form", ["json", "sarif", "github", "gitlab"])
+def test_reports_a_class_that_is_gone_in_each_form(world, form):
+    """With its file and its rule."""
+    write(world, "new/a.cdefsrc", A)
+    write(world, "old/b.cdefsrc", B)
+    result = world.inspect("gate", "--format", form, "--against=old", "new")
+    check(result.returncode == 1 and b"CMP101" in result.stdout and b"old/b.cdefsrc" in result.stdout, result)
+
+
+def test_compares_a_class_that_is_in_another_file(world):
+    """With its former file. It is not gone."""
+    old, new = with_class(ATTRIBUTE.format("Size", 1, "Int32")), with_class(ATTRIBUTE.format("Size", 2, "Int32"))
+    write(world, "old/a.cdefsrc", old)
+    write(world, "new/b.cdefsrc", old)
+    expect(world.inspect("gate", "--against=old", "new"), 0)
+    write(world, "new/b.cdefsrc", new)
+    status, findings = found(world, "--against=old", "new")
+    check((status, [each["code"] for each in findings]) == (1, ["CMP102"]), findings)
+    write(world, "new/b.cdefsrc", new.replace("Name=Disk", "Name=Drive"))
+    status, findings = found(world, "--against=old", "new")
+    check((status, [each["message"] for each in findings]) == (1, ["- ResourceClass 'Disk' (readers miss it)"]), findings)
+
+
+def test_reports_a_class_that_is_gone_from_git(world):
+    """From the directory that was given and those below it, or from the directory that is named; not from others."""
+    for name, source in (("p/a", A), ("p/below/b", B), ("elsewhere/c", HEAD), ("p/.hidden/d", HEAD)):
+        write(world, f"{name}.cdefsrc", source)
+    git(world, "init", "-q", ".")
+    git(world, "add", "-A")
+    git(world, "commit", "-qm", "old")
+    expect(world.inspect("gate", "--against=git:HEAD", "p"), 0)
+    world.path("p/below/b.cdefsrc").unlink()
+    gone = b"p/below/b.cdefsrc: error: - ResourceClass 'B' (readers miss it) [CMP101]\n1 error and 0 warnings in 1 of 2 sources\n"
+    for directory in ("p", "./p/", "p/../p"):
+        expect(world.inspect("gate", "--against=git:HEAD", directory), 1, gone)
+    expect(world.inspect("gate", "--against=git:HEAD", "."), 1, gone.replace(b"of 2", b"of 4"))
+    expect(world.inspect("gate", "--against=git:HEAD", ".", cwd=world.path("p")), 1, gone.replace(b"p/below", b"below", 1))
+    expect(world.inspect("gate", "--against=git:HEAD", "p/a.cdefsrc"), 0)
+    expect(world.inspect("gate", "--against=git:HEAD:p/below", "p"), 1, gone.replace(b"p/below", b"p", 1))
+    write(world, "p/below/e.cdefsrc", B.replace(b"Name=B", b"Name=E"))
+    expect(world.inspect("gate", "--against=git:HEAD:./", "p"), 1, gone.replace(b"of 2", b"of 3"))
+    git(world, "add", "-A")
+    git(world, "commit", "-qm", "new")
+    expect(world.inspect("gate", "--against=git:HEAD", "p"), 0)
+
+
+def test_does_not_know_what_a_damaged_older_version_had(world):
+    """The other classes are compared."""
+    write(world, "new/a.cdefsrc", A)
+    write(world, "old/a.cdefsrc", A)
+    write(world, "old/b.cdefsrc", B.replace(b"Description", b"Descripton", 1))
+    write(world, "old/c.cdef", world.good(HEAD)[:100])
+    expect(world.inspect("gate", "--against=old", "new"), 2,
+           b"cdef: old/b.cdefsrc: not a source that compiles; 'cdef check' says why\n"
+           b"cdef: old/c.cdef: not a sound database; 'cdef verify' says why\n")
+
+
 def test_refuses_older_versions_that_are_not_there(world):
     """Neither files nor revisions nor git."""
     write(world, "a.cdefsrc", HEAD)
@@ -242,6 +326,28 @@ def test_records_numbers_forever(world):
     check(recorded(world, *stanzas[:1]) == [size, mode, check_action], "gone")
     with world.left_alone("ids.lock"):
         recorded(world, *stanzas)
+
+
+def test_records_numbers_beside_the_source(world):
+    """Wherever the command runs; with a project file, beside that, so that a project has one file."""
+    write(world, "p/a.cdefsrc", A)
+    write(world, "p/sub/b.cdefsrc", B)
+    expect(world.inspect("gate", "--update", "p"), 0)
+    check(not world.path("ids.lock").exists(), "in the working directory")
+    check(world.path("p/ids.lock").exists() and world.path("p/sub/ids.lock").exists(), "not beside the sources")
+    for name in ("p/ids.lock", "p/sub/ids.lock"):
+        world.path(name).unlink()
+    one = with_class(ATTRIBUTE.format("Size", 1, "Int32"))
+    write(world, "p/a.cdefsrc", one.replace("Name=Disk", "Name=A"))
+    write(world, "p/sub/b.cdefsrc", one.replace("Name=Disk", "Name=B"))
+    write(world, "p/cdef.toml", "")
+    expect(world.inspect("gate", "--update", "./p/a.cdefsrc", "p/sub/../sub/b.cdefsrc"), 0)
+    lines = world.read("p/ids.lock").decode().split("\n")[1:-1]
+    check([each.split("\t")[0] for each in lines] == ["A", "B"] and not world.path("p/sub/ids.lock").exists(), lines)
+    expect(world.inspect("gate", "a.cdefsrc", cwd=world.path("p")), 0)
+    expect(world.inspect("gate", "b.cdefsrc", cwd=world.path("p/sub")), 0)
+    expect(world.inspect("gate", "--no-config", "p/sub/b.cdefsrc"), 2,
+           b"cdef: p/sub/b.cdefsrc: nothing to compare it with: name an older version with --against\n")
 
 
 @pytest.mark.parametrize("code,first,second,similar", [

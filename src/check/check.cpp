@@ -119,7 +119,7 @@ totals check_bytes(std::string_view bytes, const std::string &name, const warnin
 totals check_file(const std::string &path, const warning_set &wanted, const sink &to, const compile_job *job) {
     auto one = std::make_unique<source_check>(path, wanted, to, job);
     try {
-        if (path == "-") /* by its descriptor, because it may not be a file, or may be partly read */
+        if (path == "-") /* by its descriptor, because it may be a pipe, or a part of it may have been read */
             one->compiler.open(fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
         else
             one->compiler.open();

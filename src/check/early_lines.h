@@ -27,7 +27,7 @@ public:
         return first;
     }
 
-    /* The current line is to be moved. */
+    /* Notes that the current line is to be moved. */
     void move(const current_line &line);
 
     /* Moves the lines after the current one. */

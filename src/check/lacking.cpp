@@ -18,8 +18,8 @@ int type_of(int kind, std::string_view name) {
     return std::find_if(attrs.begin(), attrs.end(), [name](const auto &each) { return name == each.ta_name; })->ta_type;
 }
 
-/* An error of the stanza may be that of a line that it lacks. If it cannot be, the lack is reported beside it. Elements
- * are left alone: the index of the next one is refused for what this one lacks, and is reported with it. */
+/* An error of the stanza may be about the missing line. If it cannot be, the missing attributes are reported too. An
+ * element is left alone: if it lacks its index, that of the next one is refused, and the error is reported here. */
 bool may_be_explained(const view &see, int kind) {
     const stanza_record &stanza = see.known.stanza();
     bool has_own_error = stanza.refused.types.any();

@@ -38,7 +38,7 @@ void recovery::report_with_notes(const fatal_exit &failure, const place &met, in
     error.notes.push_back({met, stops_here(failure, see), met.column == 0 ? "" : std::string(line.raw)});
 }
 
-/* True if an error may be a separate mistake. An error that no source causes is not, if there were others before. */
+/* True if an error may be a mistake of its own. An error that no source causes is not one if others came before it. */
 bool recovery::may_follow(const fatal_exit &failure) const {
     return found.errors() == 0 || message_of(failure.id).whose != blame::program;
 }

@@ -81,7 +81,7 @@ void read_table(value_reader &reader, const toml::key &name, const toml::node &v
             read_key(reader, name.str(), key, each, to);
 }
 
-/* The line at which the parser gives up: the last one of the fewest with which it does. */
+/* The line at which the parser's assertion fails: the last line of the shortest beginning of the file that makes it. */
 int broken_line(std::string_view bytes) {
     int line = 1;
     for (std::size_t end = bytes.find('\n'); end != std::string_view::npos; end = bytes.find('\n', end + 1), ++line) {

@@ -32,7 +32,7 @@ struct settings {
     std::string baseline = {}; /* a file, a directory, or "git:REVISION[:PATH]" */
     std::string ids = {};      /* the file of numbers ever used */
 
-    /* All warnings but those that are off; one that is named both ways is on. */
+    /* All warnings except those that are off. A warning that is both in `on` and in `off` is on. */
     check::warning_set warnings() const;
 };
 

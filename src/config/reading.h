@@ -19,7 +19,7 @@ public:
     /* Each reads a value into `to`, or reports why it cannot. */
     void read_truth(const toml::node &value, bool &to);
     void read_word(const toml::node &value, const language::name_list &words, std::string &to);
-    /* Seen from the directory of the project file. */
+    /* A relative path begins at the directory of the project file. */
     void read_path(const toml::node &value, std::string &to);
     /* A path, or a revision for git, which stays as it is. */
     void read_baseline(const toml::node &value, std::string &to);

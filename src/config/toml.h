@@ -1,4 +1,4 @@
-/* toml.h: the parser of TOML, such that no file can end the program. */
+/* toml.h: the parser of TOML, configured so that no file can end the program. */
 #ifndef CDGEN_CONFIG_TOML_H
 #define CDGEN_CONFIG_TOML_H
 
@@ -6,7 +6,7 @@
 
 namespace config {
 
-/* The parser assumed something that is not so. Some wrong files make it, such as "[=". */
+/* An assertion of the parser failed. Some invalid files cause this, such as "[=". */
 struct broken_assumption : std::exception {};
 
 [[noreturn]] inline void give_up() {

@@ -1,4 +1,4 @@
-/* ids.h: the file of all numbers that were ever in use (ids.lock): what it says, and whether a class keeps to it. */
+/* ids.h: the file of all numbers that were ever in use (ids.lock), and whether a class contradicts it. */
 #ifndef CDGEN_GATE_IDS_H
 #define CDGEN_GATE_IDS_H
 
@@ -16,7 +16,7 @@
 
 namespace gate {
 
-/* An attribute or action, as its number is known to programs that store it. */
+/* The use of a number: the attribute or action that programs know by it. */
 struct numbered {
     std::string class_name;
     compare::node_kind kind;
@@ -57,10 +57,10 @@ public:
     /* The file: a line for each number, in a fixed order. */
     std::string text() const;
 
-    /* What a database says otherwise, as findings with places in its source. */
+    /* How a database contradicts the file, as findings with places in its source. */
     std::vector<check::finding> judge(const std::vector<numbered> &of, const source_places &places) const;
 
-    /* Records numbers; what was recorded under the same ones is forgotten. */
+    /* Records numbers; they replace what was recorded for the same numbers. */
     void accept(const std::vector<numbered> &of);
 
 private:

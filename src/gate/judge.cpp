@@ -1,4 +1,4 @@
-/* judge.cpp: whether a class may take the place of an older version. */
+/* judge.cpp: whether a class may replace an older version. */
 
 #include "gate/judge.h"
 

@@ -1,4 +1,4 @@
-/* judge.h: whether a class may take the place of an older version, as findings with places in its source. */
+/* judge.h: whether a class may replace an older version, as findings with places in its source. */
 #ifndef CDGEN_GATE_JUDGE_H
 #define CDGEN_GATE_JUDGE_H
 

@@ -1,4 +1,4 @@
-/* places.cpp: where in a source the things are that a comparison of databases speaks of. */
+/* places.cpp: finds the lines of a source that a difference between databases is about. */
 
 #include "gate/places.h"
 
@@ -27,7 +27,7 @@ bool has_word(std::string_view list, std::string_view word) {
     return false;
 }
 
-/* Where a part is that is gone, its owner is what the source still has. */
+/* A removed part is no longer in the source, so its place is that of its owner. */
 std::span<const node *const> what_is_left(const compare::difference &d) {
     return d.what == compare::change::REMOVED ? d.path.first(d.path.size() - 1) : d.path;
 }

@@ -1,4 +1,4 @@
-/* places.h: where in a source the things are that a comparison of databases speaks of. */
+/* places.h: finds the lines of a source that a difference between databases is about. */
 #ifndef CDGEN_GATE_PLACES_H
 #define CDGEN_GATE_PLACES_H
 

@@ -1,4 +1,4 @@
-/* fingerprint.cpp: what tells a finding from others. */
+/* fingerprint.cpp: identifies a finding among others. */
 
 #include "report/fingerprint.h"
 

@@ -1,4 +1,4 @@
-/* fingerprint.h: what tells a finding from others, and stays the same when its line moves. */
+/* fingerprint.h: identifies a finding among others, even after its line has moved. */
 #ifndef CDGEN_REPORT_FINGERPRINT_H
 #define CDGEN_REPORT_FINGERPRINT_H
 
@@ -12,7 +12,7 @@ namespace report {
 
 struct fingerprint {
     std::uint64_t hash;  /* of the code, and of the line or what else the finding is about */
-    std::uint32_t count; /* of such findings in the source so far, with this one; may be higher after 100,000 others */
+    std::uint32_t count; /* of equal findings in the source up to this one; may be too high after 100,000 others */
 
     /* "00f1e2d3c4b5a697:1" */
     std::string text() const;
@@ -25,13 +25,13 @@ public:
     fingerprint of(const std::string &file, const check::finding &found);
 
 private:
-    std::vector<std::uint32_t> counts; /* by the low bits of the hash of a finding and its file */
+    std::vector<std::uint32_t> counts; /* indexed by the low bits of the hash of a finding and its file */
 };
 
 /* Sixteen digits. */
 std::string hexadecimal(std::uint64_t number);
 
-/* FNV-1a, 64 bits, of a text and of what was hashed before it. */
+/* The FNV-1a hash, 64 bits, of a text; `before` is the hash of the texts in front of it. */
 std::uint64_t hash_of(std::string_view text, std::uint64_t before = 0xCBF29CE484222325);
 
 } // namespace report

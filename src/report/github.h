@@ -10,7 +10,7 @@ namespace report {
 struct github_command {
     bool error = true;
     std::string_view file;
-    std::string place = {};      /* ",line=1,col=2,endColumn=3", as much of it as is known */
+    std::string place = {};      /* ",line=1,col=2,endColumn=3", or the part of it that is known */
     std::string_view title = {}; /* empty: none */
 
     /* With a newline. lines: any text; a newline in it begins another line of what is shown. */

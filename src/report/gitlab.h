@@ -9,9 +9,9 @@ namespace report {
 struct gitlab_entry {
     std::string description;
     std::string_view code;
-    std::string mark; /* what tells it from other entries about the file */
+    std::string mark; /* distinguishes it from other entries about the file */
     std::string_view severity;
-    std::size_t line = 1; /* from 1, also of what has no lines, since consumers want one */
+    std::size_t line = 1; /* from 1; 1 if the file has no lines, because GitLab requires a line */
 };
 
 class gitlab_report {
@@ -20,7 +20,7 @@ public:
         to.open_list();
     }
     void add(std::string_view file, const gitlab_entry &entry);
-    /* What cannot be read. why: a message that names the file. */
+    /* Adds a file that cannot be read. why: a message that names the file. */
     void fail(std::string_view file, const std::string &why) {
         add(file, {why, "unreadable", "unreadable", "blocker"});
     }

@@ -16,7 +16,7 @@ void add_number_or_null(json_writer &to, std::string_view key, size_t number) {
         to.add_number(key, number);
 }
 
-/* Where in the file a place is, if the compiler counts its lines in another way. */
+/* Adds the place in the file if it differs from the compiler's line and column. */
 void add_physical(json_writer &to, const place &at) {
     if (line_in_file(at) == static_cast<size_t>(at.line))
         return;
@@ -27,7 +27,7 @@ void add_physical(json_writer &to, const place &at) {
         to.add_number("physical_column", at.file_column);
 }
 
-/* source: the place's line, or empty if it is not known; characters are counted in it. */
+/* source: the text of the place's line, in which characters are counted; empty if it is not known. */
 void add_place(json_writer &to, const place &at, std::string_view source) {
     constexpr const char *keys[] = {"column", "length", "character_column", "character_length"};
     add_number_or_null(to, "line", static_cast<size_t>(at.line));

@@ -8,7 +8,7 @@ namespace report {
 
 namespace {
 
-constexpr bool ASCII_ONLY = true; /* whatever a terminal would act upon is escaped */
+constexpr bool ASCII_ONLY = true; /* escapes everything that could control a terminal */
 
 } // namespace
 

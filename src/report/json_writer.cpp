@@ -1,4 +1,4 @@
-/* json_writer.cpp: JSON that is written while it is made. */
+/* json_writer.cpp: writes JSON piece by piece. */
 
 #include "report/json_writer.h"
 
@@ -21,7 +21,7 @@ void append_unit(std::string &to, char32_t unit) {
         to += text::HEX_DIGITS[unit >> shift & 0xF];
 }
 
-/* A character beyond 16 bits takes two units. */
+/* A character of more than 16 bits takes two UTF-16 units. */
 void append_escaped(std::string &to, char32_t character) {
     if (character < FIRST_OF_PAIRS)
         return append_unit(to, character);
@@ -29,7 +29,7 @@ void append_escaped(std::string &to, char32_t character) {
     append_unit(to, 0xDC00 + ((character - FIRST_OF_PAIRS) & 0x3FF));
 }
 
-/* The letter that stands for a character after a backslash; 0 if there is none. */
+/* The letter that, after a backslash, means this character; 0 if there is none. */
 char short_escape(char c) {
     constexpr std::string_view characters = "\"\\\b\f\n\r\t";
     constexpr std::string_view letters = "\"\\bfnrt";

@@ -1,4 +1,4 @@
-/* json_writer.h: JSON that is written while it is made, so that a long document need not be in memory as a whole. */
+/* json_writer.h: writes JSON piece by piece, so that a long document need not be in memory as a whole. */
 #ifndef CDGEN_REPORT_JSON_WRITER_H
 #define CDGEN_REPORT_JSON_WRITER_H
 
@@ -11,15 +11,15 @@
 
 namespace report {
 
-/* Takes a text to where it is shown. */
+/* Receives the text that is to be shown. */
 using output = std::function<void(std::string_view)>;
 
 /* Appends a text as a JSON string, in ASCII only. Bytes that are not UTF-8 (a file's name may have some) become U+FFFD.
  */
 void append_json(std::string &to, std::string_view text);
 
-/* Indented, with a newline at the end of the document. Everything stands in an object or a list, the first of which is
- * the document. In a list, keys are ignored. */
+/* Writes indented JSON, with a newline at the end of the document. Everything is in an object or a list; the first one
+ * is the document. In a list, keys are ignored. */
 class json_writer {
 public:
     explicit json_writer(output written_to) : to(std::move(written_to)) {}
@@ -37,10 +37,10 @@ public:
     void add_number(std::string_view key, std::uint64_t number);
     void add_truth(std::string_view key, bool is);
     void add_null(std::string_view key);
-    /* A value that is JSON already. */
+    /* Adds a value that already is JSON. */
     void add_json(std::string_view key, std::string_view value);
 
-    /* Adds members all or not at all: if adding them fails, such as for lack of memory, nothing of them stays. */
+    /* Adds either all of these members or none: if an exception ends the function, what it has added is removed. */
     void add_whole(const std::function<void()> &members);
 
     /* Adds the members that say which schema a document follows: a file that is installed, and its version. */
@@ -62,7 +62,7 @@ private:
     output to;
     std::string text; /* not yet written */
     std::vector<level> levels;
-    bool is_held = false; /* true: nothing is written out, since it may have to be taken back */
+    bool is_held = false; /* true: nothing is written out, because it may have to be removed */
 };
 
 } // namespace report

@@ -1,4 +1,4 @@
-/* places.cpp: places of a source as other programs and people want them. */
+/* places.cpp: places in a source, in the forms that other programs and people read. */
 
 #include "report/places.h"
 
@@ -85,7 +85,7 @@ size_t line_in_file(const place &at) {
     return static_cast<size_t>(at.file_line != 0 ? at.file_line : at.line);
 }
 
-/* The pieces of the line in front of the place are not known: their bytes count. */
+/* The text of the earlier pieces of the line is not known, so their bytes are counted. */
 character_range characters_in_file(const place &at, std::string_view source) {
     character_range characters = characters_of(at, source);
     if (at.file_column > at.column)

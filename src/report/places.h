@@ -1,4 +1,4 @@
-/* places.h: places of a source as other programs and people want them. Pure functions of texts. */
+/* places.h: places in a source, in the forms that other programs and people read. Pure functions of texts. */
 #ifndef CDGEN_REPORT_PLACES_H
 #define CDGEN_REPORT_PLACES_H
 
@@ -10,7 +10,7 @@
 
 namespace report {
 
-/* "file:line:column: ", as much of it as the place has. */
+/* "file:line:column: ", or the part of it that the place has. */
 std::string prefix_of(std::string_view file, const check::place &at);
 
 /* The source's line with its number, and below it a caret for each character of the place, in a colour if there is one
@@ -19,11 +19,11 @@ std::string excerpt_of(const check::place &at, std::string_view source, std::str
 
 inline constexpr std::string_view NO_COLOUR = "\033[0m"; /* ends a colour */
 
-/* A path as a URI: an absolute one as file:///..., a relative one as a reference. Bytes that must not stand in one are
+/* A path as a URI: an absolute one as file:///..., a relative one as a reference. Bytes that a URI may not contain are
  * written as %XX. */
 std::string uri_of(std::string_view file);
 
-/* UTF-8 characters that begin in the first bytes of a text. What begins one and is cut short counts as one. */
+/* The number of UTF-8 characters that begin in the first bytes of a text. A character that is cut off counts too. */
 std::size_t characters_in(std::string_view source, std::size_t bytes);
 
 /* The characters of a place that has a column. */
@@ -32,14 +32,14 @@ struct character_range {
     std::size_t length;
 };
 
-/* source: the place's line; if it is empty, bytes count instead of characters. */
+/* source: the text of the place's line; if it is empty, bytes are counted instead of characters. */
 character_range characters_of(const check::place &at, std::string_view source);
 
 /* "certain" or "likely" */
 const char *name_of(check::certainty sure);
 
-/* A place by the lines of the file, which end with a newline each; the compiler counts one that is too long several
- * times. A place without column has line 0 or more. */
+/* A place in the file, where each line ends with a newline; the compiler, in contrast, counts a long line several
+ * times. If the place has no column, its line may be 0. */
 std::size_t line_in_file(const check::place &at);
 character_range characters_in_file(const check::place &at, std::string_view source);
 

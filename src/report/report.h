@@ -13,7 +13,7 @@
 
 namespace report {
 
-/* Writes findings as it is given them, and keeps none of them longer than their form demands. */
+/* Writes findings one by one, and keeps a finding only as long as its form requires. */
 class writer {
 public:
     writer() = default;
@@ -21,11 +21,11 @@ public:
     writer &operator=(const writer &) = delete;
     virtual ~writer() = default;
 
-    /* A source; what is added up to its end was found in it. */
+    /* Begins a source. The findings that are added before its end belong to it. */
     virtual void begin_source(const std::string &file) = 0;
     virtual void add(const check::finding &found) = 0;
     virtual void end_source(const check::totals &count) = 0;
-    /* The same if the source could not be read, or not to its end. why: a message that names the source. */
+    /* Ends a source that could not be read to its end. why: a message that names the source. */
     virtual void fail_source(const std::string &why) = 0;
     /* There are no more sources. */
     virtual void close() = 0;
@@ -43,14 +43,14 @@ std::unique_ptr<writer> gitlab_form(output to);
 std::unique_ptr<writer> github_form(output to);
 
 struct text_settings {
-    std::size_t shown_max = 0; /* findings; 0: all. Errors are shown before warnings are */
+    std::size_t shown_max = 0; /* the most findings shown, errors first; 0: all */
     bool quiet = false;        /* only errors are shown, without a summary */
     bool coloured = false;
 };
 
-/* As compilers write it: a line for the finding and each note, and the line of the source with a mark; at the end a
- * summary. Messages of sources that cannot be read are among them. A list of known names is shown once. Nothing of a
- * source, or of its name, can steer a terminal. */
+/* The form that compilers use: a line for each finding and note, below it the marked line of the source, and at the end
+ * a summary. Messages about unreadable sources are included. Each list of known names is shown only once. No text from
+ * a source, and no file name, can control a terminal. */
 std::unique_ptr<writer> text_form(output to, const text_settings &settings);
 
 /* One finding in that form. */

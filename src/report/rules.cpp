@@ -1,4 +1,4 @@
-/* rules.cpp: what is known of each code. */
+/* rules.cpp: what each code means. */
 
 #include "report/rules.h"
 

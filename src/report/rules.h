@@ -1,4 +1,4 @@
-/* rules.h: what is known of each code, of errors and of warnings alike. */
+/* rules.h: what each code means, for errors and for warnings. */
 #ifndef CDGEN_REPORT_RULES_H
 #define CDGEN_REPORT_RULES_H
 
@@ -20,7 +20,7 @@ struct rule {
 /* The errors, then the warnings. */
 const std::vector<rule> &all_rules();
 
-/* What help says of a cause and a cure. */
+/* The help text that is made from a cause and a cure. */
 std::string help_of(std::string_view cause, std::string_view cure);
 
 } // namespace report

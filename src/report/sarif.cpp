@@ -23,8 +23,8 @@ using check::note;
 using check::place;
 using json = nlohmann::ordered_json;
 
-/* Columns are characters; without the line, bytes have to do. The source as a whole is at its first line, since
- * consumers want a line. */
+/* Columns are counted in characters or, if the text of the line is not known, in bytes. A finding about the whole
+ * source is at the first line, because consumers require a line. */
 json region_of(const place &at, std::string_view source) {
     json region;
     region["startLine"] = std::max<size_t>(line_in_file(at), 1);
@@ -44,7 +44,7 @@ json location_of(const std::string &file, const place &at, std::string_view sour
     return location;
 }
 
-/* What an edit removes: nothing, a part of a line, or the newline at its end too. */
+/* The region that an edit removes: empty, a part of a line, or a part that includes the newline at its end. */
 json replacement_of(const check::edit &made) {
     bool ends_line = made.removed.ends_with('\n');
     json replacement;

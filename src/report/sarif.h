@@ -1,4 +1,4 @@
-/* sarif.h: a log of SARIF 2.1.0, whatever its results are about. */
+/* sarif.h: a log of SARIF 2.1.0, for results about sources or about databases. */
 #ifndef CDGEN_REPORT_SARIF_H
 #define CDGEN_REPORT_SARIF_H
 
@@ -18,7 +18,7 @@ public:
     sarif_log(output written_to, std::string_view tool, std::span<const rule> rules);
 
     void add(const nlohmann::ordered_json &result);
-    /* What cannot be read. why: a message that names the file. */
+    /* Adds a file that cannot be read. why: a message that names the file. */
     void fail(const std::string &file, const std::string &why);
     void close();
 

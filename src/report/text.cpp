@@ -64,7 +64,7 @@ private:
     bool coloured;
 };
 
-/* Findings wait while it is not certain that they are shown: a later error takes the place of a warning. */
+/* Warnings are kept until it is certain that they are shown, because a later error may take the place of one. */
 class text_writer : public writer {
 public:
     text_writer(output written_to, const text_settings &wanted) : to(std::move(written_to)), settings(wanted) {}
@@ -163,9 +163,9 @@ private:
     std::deque<item> waiting;
     size_t waiting_warnings = 0;
     size_t shown = 0;              /* or waiting to be shown */
-    std::set<std::uint64_t> lists; /* of known names that have been shown: each is shown once */
+    std::set<std::uint64_t> lists; /* lists of known names that have been shown, because each is shown only once */
     size_t sources = 0;
-    size_t latest_faulty = 0; /* the number of the latest source in which anything was found */
+    size_t latest_faulty = 0; /* the number of the latest source that has findings */
     size_t faulty_sources = 0;
     check::totals all;
     std::string text; /* not yet written */

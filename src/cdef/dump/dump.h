@@ -24,7 +24,7 @@ using facts::named_bits;
 using facts::none;
 using facts::word;
 
-/* The text of a fact in the listing: one line, without bytes that a terminal would act upon. */
+/* The text of a fact in the listing: one line, without bytes that could control a terminal. */
 void append(std::string &to, const fact &f);
 std::string as_text(const fact &f);
 

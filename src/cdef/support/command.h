@@ -1,5 +1,5 @@
-/* command.h: what a subcommand is called with. The library that reads command lines is known to command.cpp and
- * cdef.cpp alone, because it takes the compiler longer to read than any subcommand. */
+/* command.h: the options and operands of a subcommand. Only command.cpp and cdef.cpp include the library that reads
+ * command lines, because compiling it takes longer than compiling any subcommand. */
 #ifndef CDGEN_CDEF_COMMAND_H
 #define CDGEN_CDEF_COMMAND_H
 
@@ -16,7 +16,7 @@ class Option;
 
 namespace cdef {
 
-/* An option or an operand. Each function returns it again. */
+/* An option or an operand. Each function returns the option itself. */
 class option {
 public:
     explicit option(CLI::Option &added) : made(&added) {}
@@ -29,7 +29,7 @@ public:
     option one_of_unlisted(const std::vector<std::string> &words);
     /* check returns what is wrong with a value, or nothing. */
     option checked(const std::function<std::string(const std::string &)> &check);
-    /* Given twice, it takes one value each time, not all that follow. */
+    /* Makes it take one value each time it is given, not all values that follow. */
     option one_value_each();
     /* What help shows instead of the kind of the value and whether it is required. */
     option shown_as(const std::string &text);
@@ -40,7 +40,7 @@ private:
     CLI::Option *made;
 };
 
-/* A subcommand. What its options are stored in must outlive it. */
+/* A subcommand. The variables in which its options are stored must outlive it. */
 class command {
 public:
     explicit command(CLI::App &added) : made(&added) {}
@@ -51,7 +51,7 @@ public:
     option add(const std::string &names, std::vector<std::string> &to, const std::string &help);
     /* From 1 to most. */
     option add_number(const std::string &names, unsigned &to, unsigned most, const std::string &help);
-    /* From 0. Help shows what it is by default. */
+    /* From 0. The help shows the default. */
     option add_count(const std::string &names, std::size_t &to, const std::string &help);
     option add_flag(const std::string &names, bool &to, const std::string &help);
     /* A flag that may have a value, after "=". */

@@ -57,7 +57,7 @@ std::unique_ptr<report::writer> finding_options::writer(const std::vector<report
 }
 
 void finding_options::fail_source(report::writer &to, const std::string &why) const {
-    if (form != "text") /* which shows it itself */
+    if (form != "text") /* that form shows the reason itself */
         print_error(why);
     to.fail_source(why);
 }

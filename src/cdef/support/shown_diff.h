@@ -7,9 +7,9 @@
 
 namespace cdef {
 
-/* The unified diff from the one text of a source to the other, with the names that git gives the two; empty if they are
- * the same. Of what a terminal would act upon, a terminal as standard output gets nothing; a file gets all, so that
- * patch can use it. */
+/* The unified diff between two texts of a source, with file names as git writes them; empty if the texts are the same.
+ * If standard output is a terminal, characters that could control it are replaced. Otherwise the diff is complete, so
+ * that patch can use it. */
 std::string shown_diff(const std::string &source, std::string_view before, std::string_view after);
 
 } // namespace cdef

@@ -1,4 +1,4 @@
-/* exchange.cpp: what is found in databases in the forms of SARIF, GitHub and GitLab. */
+/* exchange.cpp: findings in databases as SARIF, and as GitHub and GitLab read them. */
 
 #include "cdef/support/output.h"
 #include "cdef/verify/findings.h"
@@ -24,10 +24,10 @@ bool is_error(const cdb::finding &f) {
     return f.broken->level == cdb::severity::error;
 }
 
-/* Tells findings about one file apart. */
+/* Distinguishes findings about one file from each other. */
 class marks {
 public:
-    /* The same for a finding at the same field of another file, whatever was found there. */
+    /* The mark of a finding. A finding about the same field of another file has the same mark, whatever was found. */
     std::string of(const cdb::finding &f) {
         std::string mark = std::string(f.broken->code) + " " + place_of(f);
         unsigned count = ++counts[mark];
@@ -122,7 +122,7 @@ private:
     }
 
     static void add_related(ordered_json &result, const std::string &file, std::span<const cdb::diagnosed> all) {
-        std::set<std::string> shown; /* consumers want each once */
+        std::set<std::string> shown; /* each may occur only once */
         for (const cdb::diagnosed &each : all) {
             std::string text = sentence_of(each.found) + " [" + std::string(each.found.broken->code) + "]";
             if (!shown.insert(text).second)

@@ -10,13 +10,13 @@
 
 namespace cdef::verify {
 
-/* "section 2, rsrc_pattr_t 5, u_ra_name": as much of it as is known. */
+/* "section 2, rsrc_pattr_t 5, u_ra_name", or the part of it that is known. */
 std::string place_of(const cdb::finding &f);
 
 /* "section 2, rsrc_pattr_t 5, u_ra_name at offset 8: wrong reference: found 5, expected 8" */
 std::string sentence_of(const cdb::finding &f);
 
-/* "1 finding follows from this one", or another number of them. */
+/* "1 finding follows from this one", or "5 findings follow from this one". */
 std::string count_of(std::size_t consequences);
 
 /* How many of the findings after a cause are its consequences. */

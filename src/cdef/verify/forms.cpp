@@ -1,4 +1,4 @@
-/* forms.cpp: what is found in databases as text and as JSON. */
+/* forms.cpp: findings in databases as text and as JSON. */
 
 #include "cdef/verify/forms.h"
 

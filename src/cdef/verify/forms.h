@@ -1,4 +1,4 @@
-/* forms.h: what is found in databases, in the forms that people and other programs read. */
+/* forms.h: findings in databases, in the forms that people and other programs read. */
 #ifndef CDGEN_CDEF_VERIFY_FORMS_H
 #define CDGEN_CDEF_VERIFY_FORMS_H
 
@@ -10,7 +10,7 @@
 
 namespace cdef::verify {
 
-/* Shows what is found in each database. */
+/* Shows the findings in each database. */
 class form {
 public:
     form() = default;

@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Writes the manual pages that say what a document says, so that it stands once.
+"""Writes the manual pages that have the same text as a document, so that the text is written only once.
 
     from_markdown.py [DIRECTORY]
 
@@ -23,10 +23,10 @@ MADE = [
 ]
 FILES = """## Files
 
-The documents, the examples and the headers are named as they stand in the project. Below the place where cdgen is \
-installed, such as `/usr`:
+This page names the documents, the examples and the headers by their paths in the project. They are installed in these \
+directories below the prefix, such as `/usr`:
 
-| directory | has |
+| directory | contains |
 |---|---|
 | `share/doc/cdgen/docs` | documents, such as `language.md` |
 | `share/doc/cdgen/examples` | examples, such as `FileSystem.cdefsrc` |
@@ -37,7 +37,7 @@ DATE = "2026-11-21"  # of the release
 LINE = 72  # characters that a table may take
 PAGES = {document: f"`{name}`({SECTION})" for document, name, what in MADE}
 PLAIN_HEADINGS = ("meaning", "content", "rule")  # of a last column that explains itself
-WIDE_COLUMN = 24  # characters that a column needs which shares what room there is
+WIDE_COLUMN = 24  # characters that each of the columns needs which share the remaining room
 
 
 def escape(text):
@@ -46,7 +46,7 @@ def escape(text):
 
 
 def link(match):
-    """A document that is a page too by the page's name, everything else by its own."""
+    """The text of a link. A document that is also a page is called by the name of the page."""
     text, target = match.groups()
     return PAGES.get(target, text) if text == target else text
 
@@ -126,7 +126,7 @@ def longest_word(rows, column):
 
 
 def wide_table(head, rows):
-    """Narrow columns as they are, the others share the rest of the line."""
+    """Narrow columns keep their width; the others share the rest of the line."""
     widths = [max(len(row[i].replace("`", "")) for row in [head, *rows]) for i in range(len(head))]
     wide = wide_columns(widths)
     if sum(wide) > 1 or any(wide) and longest_word(rows, wide.index(True)) > room(widths, wide):

@@ -56,7 +56,7 @@ void require_different(const std::vector<unit> &units) {
         for (const output &made : each.outputs) {
             auto [at, is_new] = makers.emplace(std::filesystem::path(made.path).lexically_normal().string(), &each);
             if (!is_new)
-                throw wrong_request(made.path + ": it would be made of " + at->second->source + " and of " +
+                throw wrong_request(made.path + ": it would be built from " + at->second->source + " and from " +
                                     each.source);
         }
 }

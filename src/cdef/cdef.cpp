@@ -1,4 +1,4 @@
-/* cdef.cpp: the command line of cdef, which shows what is in a class definition database. */
+/* cdef.cpp: the command line of cdef, with its subcommands. */
 
 #include "cdef/cdef.h"
 #include "cdef/support/command.h"
@@ -59,7 +59,7 @@ std::string complaint(const CLI::App &app, const CLI::Error &usage) {
 }
 
 int run(int argc, char **argv) {
-    CLI::App app("Shows, checks and compares class definition databases.", "cdef");
+    CLI::App app("Checks class definitions and builds, shows and compares their databases.", "cdef");
     app.set_version_flag("--version", "cdef " CDGEN_VERSION);
     app.require_subcommand(1);
     app.failure_message([](const CLI::App *program, const CLI::Error &usage) {

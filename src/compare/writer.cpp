@@ -32,7 +32,7 @@ void allowance::spend(std::size_t length) {
     if (length <= LINE)
         return;
     if (length > left)
-        throw too_entangled("values or texts that lead to the same place too often");
+        throw too_entangled("too many references lead to the same values or texts");
     left -= length;
 }
 

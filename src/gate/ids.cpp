@@ -26,10 +26,10 @@ constexpr ids_rule rows[] = {
     {"CMP401",
      {},
      "a number was used for another name",
-     "`ids.lock` says that the number belonged to another attribute or action. What was stored under it, and who knows "
-     "it, would mean the new one.",
-     "Take a number that was never used. If nothing was ever stored or known under it, `cdef gate --update` accepts "
-     "it."},
+     "`ids.lock` says that the number belonged to another attribute or action. Stored values and programs that use the "
+     "number would now refer to the new one.",
+     "Take a number that was never used. If no stored value and no program uses the number, accept it with `cdef gate "
+     "--update`."},
     {"CMP402",
      {},
      "a number was used for another kind of attribute",
@@ -39,7 +39,7 @@ constexpr ids_rule rows[] = {
     {"CMP403",
      {},
      "a number was used for values of another type",
-     "`ids.lock` says that values under the number have another type. Stored ones would be misread.",
+     "`ids.lock` says that values under the number have another type. Stored values would be misread.",
      "Define a new attribute with a number that was never used, or accept it with `cdef gate --update`."},
     {"CMP404", "unrecorded-number", "a number is not in ids.lock",
      "The number is new. Unless it is recorded, it can be used again for something else later.",
@@ -47,7 +47,7 @@ constexpr ids_rule rows[] = {
 };
 static_assert(std::size(rows) == static_cast<std::size_t>(ids_breach::UNRECORDED) + 1);
 
-/* What may stand for a tab, a newline and a backslash. */
+/* The escapes for a tab, a newline and a backslash. */
 constexpr std::pair<char, char> ESCAPES[] = {{'\t', 't'}, {'\n', 'n'}, {'\r', 'r'}, {'\\', '\\'}};
 
 void append_field(std::string &to, std::string_view text, char end) {
@@ -61,7 +61,7 @@ void append_field(std::string &to, std::string_view text, char end) {
     to += end;
 }
 
-/* Nothing if a backslash means nothing. */
+/* No value if a backslash begins no known escape. */
 std::optional<std::string> unescaped(std::string_view field) {
     std::string text;
     for (std::size_t i = 0; i < field.size(); ++i) {
@@ -92,7 +92,7 @@ std::optional<node_kind> kind_called(std::string_view text) {
     return found == recorded_kinds.end() ? std::nullopt : std::optional(*found);
 }
 
-/* Attributes that share their numbers are of the family of the persistent ones. */
+/* Persistent and dynamic attributes share their numbers; the family of both is that of the persistent ones. */
 node_kind family_of(node_kind kind) {
     if (kind == node_kind::dynamic_attribute)
         return node_kind::persistent_attribute;

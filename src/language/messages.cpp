@@ -17,8 +17,8 @@ constexpr message table[] = {
     /* Lines and stanzas */
     {MSG_UNKNOWN_STANZA, "S101", "Invalid table name: ", FIRST, mark_kind::text, blame::source,
      "A line that starts in column 1 names no stanza kind.",
-     "Spell the kind as language.md does; start an attribute line with a blank or a tab. The note says "
-     "whether a carriage return at the end of the line or a byte order mark in front of it is to blame: "
+     "Spell the kind as language.md does; start an attribute line with a blank or a tab. If the cause is "
+     "a carriage return at the end of the line or a byte order mark in front of it, the note says so: "
      "remove it."},
     {MSG_NO_STANZA, "S102", "Attribute found but no table defined yet", FIRST, mark_kind::text, blame::source,
      "An attribute line comes before the first header, or the first header starts with a blank.",
@@ -106,8 +106,8 @@ constexpr message table[] = {
     {MSG_ELEMENT_DEFAULT, "S212", "Sorry, default SD values are not yet supported", FIRST, mark_kind::name,
      blame::source, "An element has a `DefaultValue`.", "Remove it: an element has the default of its type."},
     {MSG_SECOND_MANAGER, "S213", "Resource manager already defined: ", FIRST, mark_kind::value, blame::source,
-     "`ResourceManager` is given a second time; the first name follows. Within one stanza that is S109, "
-     "and a second stanza is S118, so no source causes this.",
+     "`ResourceManager` is given a second time; the first name follows. Within one stanza this is reported as S109, "
+     "and a second stanza as S118, so no source causes this.",
      "Remove one of the two."},
     {MSG_SBS_TYPE, "S214", "VX_SBS_TYPE not supported", FIRST, mark_kind::none, blame::source,
      "An attribute, or an element of one, is of type `SBS`.", "Choose another type."},

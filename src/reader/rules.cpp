@@ -12,13 +12,13 @@ using enum severity;
 
 constexpr const char *REBUILD = "Compile the source again, or take another copy of the file: this one is damaged.";
 constexpr const char *CHECK_SOURCE =
-    "Nothing, if the source is meant so: a reader has to expect it. `cdef check` shows what "
+    "If the source is as intended, nothing: readers have to accept such databases. `cdef check` shows what "
     "the source may have meant.";
 
 /* By check. */
 constexpr rule all_rules[] = {
     {"CDB101", error, "file too short for a header", "The file has fewer than 80 bytes. Nothing else is checked.",
-     "Take the whole file: it was cut, or is another one."},
+     "Get the whole file. If this is the whole file, it is not a database."},
     {"CDB102", error, "length in the header is not the file's size minus 4",
      "The file was cut, or something was added to it.", REBUILD},
     {"CDB103", error, "missing format word",
@@ -27,7 +27,7 @@ constexpr rule all_rules[] = {
     {CODE_CHECKSUM, error, "wrong checksum", "Something was changed after the file was made.", REBUILD},
     {"CDB105", error, "unknown record size in the header", "The file was made for records of other sizes.", REBUILD},
     {CODE_RESERVED, error, "reserved bytes or padding not zero",
-     "Bytes that have no meaning are not 0, as the compiler writes them.", REBUILD},
+     "Bytes that have no meaning are not 0, although the compiler writes 0 there.", REBUILD},
     {"CDB107", error, "ID in the header is not the largest",
      "The header states another number than the largest one among the classes or managers.", REBUILD},
     {"CDB201", error, "anchors extend beyond the end of the file",
@@ -49,9 +49,8 @@ constexpr rule all_rules[] = {
      "A table of a section does not begin where the one before it ends.", REBUILD},
     {"CDB303", error, "table extends beyond the end of the section", "The counts of a section lead beyond its end.",
      REBUILD},
-    {"CDB304", error, "missing reference", "A reference says that there is nothing, where there has to be something.",
-     REBUILD},
-    {"CDB305", error, "reference outside its table", "A reference to a list leads out of the table of these lists.",
+    {"CDB304", error, "missing reference", "A reference is \"none\" in a place where that is not allowed.", REBUILD},
+    {"CDB305", error, "reference outside its table", "A reference to a list leads out of the table of such lists.",
      REBUILD},
     {"CDB306", error, "reference is not a multiple of 8",
      "A reference to a text or a list, or the size of a variable class's strings, is not a multiple of 8.", REBUILD},
@@ -75,7 +74,7 @@ constexpr rule all_rules[] = {
      "The source has two classes, and the second one begins before the last attribute of the first is complete.",
      "Check the source: S514 names the attribute."},
     {"CDB354", warning, "structured data without a definition, or of another length than its definition",
-     "The source gives an attribute of structured data no elements, or the run belongs to something else.",
+     "The source gives an attribute of structured data no elements, or they belong to something else.",
      "Check the source: S502 and S518 name the line."},
     {"CDB355", warning, "unreferenced bytes in a table of lists", "Bytes in a table of lists belong to no list.",
      CHECK_SOURCE},
@@ -83,8 +82,8 @@ constexpr rule all_rules[] = {
     {"CDB402", error, "offset of a value is not a multiple of 8", "A value of 8 bytes is not at a multiple of 8.",
      REBUILD},
     {"CDB403", error, "value with two owners, or overlapping values",
-     "Two records refer to the same value, or their values overlap. Names are among them; only a reference that is 0 "
-     "because no name was given may share the first text.",
+     "Two records refer to the same value, or their values overlap. This applies to names and other texts too, except "
+     "that a reference that is 0 because no name was given may share the first text.",
      REBUILD},
     {"CDB404", error, "values nested too deep", "More than 64 arrays and structures are inside one another.", REBUILD},
     {"CDB405", error, "element with an invalid data type",

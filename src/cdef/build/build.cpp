@@ -107,7 +107,7 @@ void require_no_contradiction(const build_options &options) {
     if (options.findings.form != "text")
         throw failure("-o - and --format " + options.findings.form + ": both would be written to standard output");
     if (options.depfile)
-        throw failure("-o - and --depfile: standard output has no name that could depend on anything");
+        throw failure("-o - and --depfile: standard output has no name for which dependencies could be written");
 }
 
 void make_directory(const std::string &path) {

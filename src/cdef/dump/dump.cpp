@@ -44,7 +44,7 @@ void add_dump(program &app) {
     });
     made.add("FILE", options->file, "Database to show; - is standard input").required();
     add_forms(made, options->form, {"text", "json", "hex"},
-              "Form of what is shown: text, json, or hex: every byte and what it is, even of a damaged file");
+              "Form of the output; hex shows every byte and its meaning, even of a damaged file");
     add_colour(made, options->colour);
     made.add_flag("--offsets", options->with_offsets, "Also show the offset of each record and list");
 }

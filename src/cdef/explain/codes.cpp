@@ -38,10 +38,11 @@ explanation explained(const compare::breach_rule &row) {
         "error",
         {},
         row.title,
-        "Whoever relies on the older version is affected: " + std::string(row.reason) + ". It counts at the level `" +
-            std::string(compare::name_of(row.broken_for)) + "` and those after it.",
-        "Take the change back, or add something new beside what was there, unless nobody relies on the older version "
-        "in this way.",
+        "Whoever relies on the older version is affected: " + std::string(row.reason) +
+            ". The rule applies at the level `" + std::string(compare::name_of(row.broken_for)) +
+            "` and those after it.",
+        "Take the change back, or add something new and keep the old. If nobody relies on the older version in this "
+        "way, the change is harmless.",
         nullptr};
 }
 

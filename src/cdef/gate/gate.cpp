@@ -274,7 +274,7 @@ void add_gate(program &app) {
              "Source or database, or directory of sources (*.cdefsrc); - is standard input")
         .required();
     made.add("--against", options->against, "The older version: a file, a directory, or git:REVISION[:PATH]");
-    made.add("--level", options->level, "What relies on it; each level includes those before")
+    made.add("--level", options->level, "What relies on the older version; each level includes those before it")
         .one_of({"readers", "clients", "stored"});
     made.add("--ids", options->ids,
              "File of all numbers that have been in use; the default is ids.lock beside cdef.toml or the source");

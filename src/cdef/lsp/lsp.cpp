@@ -1,4 +1,4 @@
-/* lsp.cpp: the subcommand that serves editors over standard input and output. */
+/* lsp.cpp: the subcommand that is a language server for editors, on standard input and output. */
 
 #include "cdef/cdef.h"
 #include "cdef/lsp/files.h"
@@ -25,7 +25,7 @@ namespace cdef {
 namespace {
 
 struct lsp_options {
-    bool standard_streams = false; /* ignored: clients pass it, and there is no other way */
+    bool standard_streams = false; /* accepted, because clients pass it, but without effect */
     std::string explanations;
     project_options project;
 };
@@ -110,9 +110,9 @@ int connection::serve() {
 
 void add_lsp(program &app) {
     auto options = std::make_shared<lsp_options>();
-    command made = app.add("lsp", "Serves editors: the Language Server Protocol on standard streams",
+    command made = app.add("lsp", "Helps editors, by the Language Server Protocol on standard input and output",
                            [options] { return connection(*options).serve(); });
-    made.add_flag("--stdio", options->standard_streams, "Ignored: there is no other way to connect");
+    made.add_flag("--stdio", options->standard_streams, "Ignored: the server always uses standard input and output");
     made.add("--explanations", options->explanations,
              "URI of the page that explains the codes, instead of the installed one");
     add_project_options(made, options->project);

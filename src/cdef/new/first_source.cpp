@@ -14,9 +14,9 @@ namespace cdef::new_command {
 namespace {
 
 constexpr std::string_view TEMPLATE =
-    R"(# Lines in column 1 begin stanzas; the indented lines below them are attributes. The
-# manual page cdefsrc(5) explains all of them. Numbers of descriptions and names are those
-# of messages in the message catalog of the last stanza, which has the texts.
+    R"(# A line that begins in column 1 starts a stanza; the indented lines below it are its
+# attributes. The manual page cdefsrc(5) explains all of them. Each Description, DisplayName
+# and ValueDisplayName is the number of a message in the catalog that the last stanza names.
 
 ControlDefinition
 	FileVersion=1.0.0.0
@@ -31,7 +31,7 @@ ResourceClass
 	# The attribute that says where a resource is.
 	Locator=HostName
 
-# Stored with each resource. Programs know an attribute by its Id: never use one again.
+# Stored for each resource. Programs know an attribute by its Id, so never use an Id again.
 PersistentResourceAttribute
 	Name=HostName
 	Description=3
@@ -55,7 +55,7 @@ PersistentResourceAttribute
 	ValueDisplayName=8
 	DefaultValue=1
 
-# Who serves the class, and where its texts are.
+# The program that serves the class, and the catalog with its texts.
 ClassToManagerMapping
 	ResourceManager=@PLAIN@Manager
 	FirstKey=1

@@ -26,9 +26,9 @@ constexpr std::string_view SUFFIX = ".cdef";
 
 constexpr std::string_view HEADING =
     "Written by 'cdef source' from a database.\n"
-    "What a database does not hold is not here either: comments, lines without effect (a Locator or\n"
-    "a VariableClass that names nothing, a DefaultValue of a class attribute, ListAction lines), and\n"
-    "the texts of permission templates.";
+    "The database does not contain the following, so it is missing here: comments, lines without\n"
+    "effect (a Locator or a VariableClass with an unknown name, a DefaultValue of a class attribute,\n"
+    "ListAction lines), and the texts of permission templates.";
 
 /* ---- The class ------------------------------------------------------------------------------------------------- */
 

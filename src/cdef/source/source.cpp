@@ -38,7 +38,7 @@ int run(const std::string &path) {
         throw failure(path + ": " + e.what());
     }
     if (isatty(STDOUT_FILENO) != 0 && !is_harmless(text))
-        throw failure(path + ": the source has characters that are not for terminals: write it to a file");
+        throw failure(path + ": the source contains characters that could control a terminal: write it to a file");
     print(text);
     return OK;
 }

@@ -19,10 +19,10 @@ struct meanings {
     std::string_view failed;
 };
 
-/* FAILED also stands for a wrong command line and for output that cannot be written. */
+/* FAILED also means a wrong command line, or output that cannot be written. */
 inline constexpr std::array<meanings, 11> statuses = {{
-    {"verify", "no errors", "errors, or warnings with --werror", "a file cannot be read, or is a text"},
-    {"dump", "the database is shown", "", "the database cannot be read, or is not sound (--hex shows it then too)"},
+    {"verify", "no errors", "errors, or warnings with --werror", "a file cannot be read, or is a text file"},
+    {"dump", "the database is shown", "", "the file cannot be read or, without --hex, is not a sound database"},
     {"diff", "no difference (with --compat: B can take the place of A)", "differences (with --compat: it cannot)",
      "a database cannot be read or is not sound, or the output would be too large"},
     {"source", "the source is written", "", "the database cannot be read, or no source reproduces it"},
@@ -32,11 +32,13 @@ inline constexpr std::array<meanings, 11> statuses = {{
     {"build", "all databases are made or up to date",
      "errors, or warnings with --werror; the databases of the other sources are made",
      "a file cannot be read or written; the other databases are made"},
-    {"gate", "nothing breaks", "something breaks, or a source has errors; with --werror, or warnings",
+    {"gate", "nothing breaks", "something breaks, a source has errors, or with --werror there are warnings",
      "a file or an older version cannot be read"},
-    {"new", "the source is written", "", "the source exists or cannot be written, or no source can have the name"},
+    {"new", "the source is written", "",
+     "the source exists or cannot be written, or a source cannot give a class this name"},
     {"explain", "the codes are explained", "", "there is no such code"},
-    {"lsp", "the client has shut the server down", "the client ended without that", "standard input cannot be read"},
+    {"lsp", "the client has shut the server down", "the client has ended without shutting the server down",
+     "standard input cannot be read"},
 }};
 
 /* "Exit status: 0: ...; 1: ...; 2: ...", the end of a subcommand's help. */

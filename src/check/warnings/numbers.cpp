@@ -31,7 +31,7 @@ public:
 
     void number(const view &see, const number_part &part) override {
         if (part.form == number_form::VERSION_REST)
-            return void(report(see, place_of(see, part), "a version has four parts: these are cut off"));
+            return void(report(see, place_of(see, part), "a version has four parts: the rest is ignored"));
         if (part.form != number_form::VERSION_PART && bits_of(part.form) == 0)
             return;
         check::number n(part.text, part.form == number_form::VERSION_PART ? 10 : 0);
@@ -168,7 +168,7 @@ private:
         if (!is_plain(part.text, 32))
             look_at_unsigned(see, part);
         if (see.compiler.element_index() == TOO_HIGH && see.compiler.run_has_highest_index())
-            report(see, place_of(see, part), "does not fit 16 bits, which the attribute's highest index has");
+            report(see, place_of(see, part), "does not fit into the 16 bits in which the highest index is stored");
     }
 
     void look_at_version(const view &see, const number_part &part) {

@@ -38,7 +38,7 @@ static_assert(LINE_MAX_CHARS == 254, "the cause of a long line says so");
 
 constexpr row rows[] = {
     {{LONG_LINE, "S516", "long-line", "a line is read in pieces",
-      "A line has more than 253 characters. What comes after 254, even if it is only the newline, is read "
+      "A line has more than 253 characters. What follows the 254th, even if it is only the newline, is read "
       "as a line of its own, and the numbers of later lines are one higher. Reported once for each line.",
       "Shorten the line or its comment."},
      make_long_line},
@@ -47,14 +47,14 @@ constexpr row rows[] = {
       "Save the source with newlines only."},
      make_carriage_return},
     {{TEXT_AFTER_QUOTE, "S520", "text-after-quote", "text follows the quote that seems to end a value",
-      "A value in quotes contains a quote that makes no pair with another one, with text after it.",
-      "Remove it if it is not part of the value. A value that is to begin and end with quotes needs a second pair of "
-      "them: `\"\"a\" == \"b\"\"`. Any other value that contains quotes needs none around it: leave the outer ones "
-      "off. "
-      "A backslash in front of a quote is stored with it."},
+      "A value in quotes contains another quote that has no partner, with text after it.",
+      "Remove the quote if it is not part of the value. If the value itself begins and ends with a quote, put another "
+      "pair of quotes around it: `\"\"a\" == \"b\"\"`. Around any other value that contains quotes, put none. A "
+      "backslash in front of a quote is stored too."},
      make_text_after_quote},
     {{NUMBER_TEXT, "S510", "number-text", "a number is followed by text, or there is none",
-      "Text after a number is ignored; or there is no number and 0 is stored, as for a part of `1..2`.",
+      "There is text after a number, which is ignored. Or there is no number, as in the middle of `1..2`, and 0 is "
+      "stored.",
       "Write only the number."},
      make_number_text},
     {{NARROWED, "S508", "narrowed", "a number does not fit and is cut",
@@ -76,19 +76,21 @@ constexpr row rows[] = {
       "Give each value once."},
      make_overlap},
     {{SAME_ID, "S507", "same-id", "two attributes or actions have the same Id",
-      "Two attributes or actions of one kind have the same `Id`, or a persistent and a dynamic attribute of a "
-      "resource, or of the class. Text that is not a number (S510) does not count.",
+      "Two attributes or actions of one kind have the same `Id`. The same is reported of a persistent and a dynamic "
+      "attribute, if both are attributes of a resource or both of the class. Text that is not a number (S510) does not "
+      "count.",
       "Give one of them another number."},
      make_same_id},
-    {{SAME_NAME, "S506", "same-name", "two names are the same, but for case",
+    {{SAME_NAME, "S506", "same-name", "two names are equal or differ only in case",
       "Two attributes, actions or elements of one kind, or two variable classes, have the same name, or names that "
-      "differ only in case. Or this is true of a persistent and a dynamic attribute of a resource, or of the class.",
+      "differ only in case. The same is reported of a persistent and a dynamic attribute, if both are attributes of a "
+      "resource or both of the class.",
       "Rename one."},
      make_same_name},
-    {{RANGE_ELSEWHERE, "S503", "range-elsewhere", "a Range does not reach its attribute",
+    {{RANGE_ELSEWHERE, "S503", "range-elsewhere", "a Range does not take effect in its own attribute",
       "A `Range` of a `DynamicClassAttribute` is stored in a `DynamicResourceAttribute` that is still "
-      "open. Or another dynamic attribute is completed first, which clears the mark that a `Range` was "
-      "given. If that one has no `Range` itself, it has the range 0 to 0 instead of 0 to 100.",
+      "open. Or another dynamic attribute is completed between the `Range` and the end of its own attribute. Then the "
+      "`Range` may be lost, and the other attribute, if it has no `Range`, gets the range 0 to 0 instead of 0 to 100.",
       "Put dynamic class attributes first, and one without a `Range` last among them. After an attribute "
       "with a `Range`, put another of its kind."},
      make_range_elsewhere},
@@ -96,8 +98,8 @@ constexpr row rows[] = {
       "A `PersistentClassAttribute` has a `DefaultValue`, which is never used.", "Remove the line."},
      make_unused_default},
     {{PERMISSION, "S512", "permission", "a Permission is not one known letter",
-      "A `Permission` has more than one letter, of which only the first counts; or the letter is unknown, "
-      "so that no permission is needed.",
+      "A `Permission` has more than one letter, of which only the first counts. Or the letter is unknown, "
+      "so no permission is needed.",
       "Write one of q, l, e, v, d, c, s, o, a and x."},
      make_permission},
     {{ELEMENT_TYPE, "S513", "element-type", "an element's data type is unknown",
@@ -128,17 +130,17 @@ constexpr row rows[] = {
       "Only the last one counts.",
       "Remove one of the lines. For a list of values, choose an array type."},
      make_overridden},
-    {{COMMA_LIST, "S526", "comma-list", "a list with commas is not a list",
-      "A `ValidValue` or `ValidStateValue` of texts has more than one comma: it is a range, from what "
-      "comes before the first comma to all that comes after it. Or an element of a `StringArray` or `BinaryArray` "
-      "has commas and no quotes: a line is one element.",
+    {{COMMA_LIST, "S526", "comma-list", "commas do not separate values",
+      "A `ValidValue` or `ValidStateValue` of texts has more than one comma. It is a range: the text before the first "
+      "comma is its lower end, and all the text after that comma is its upper end. Or an element of a `StringArray` or "
+      "`BinaryArray` has commas and no quotes: the whole line is one element.",
       "Write one line for each value or element. Put an element with commas in quotes."},
      make_comma_list},
-    {{IGNORED_RANGE, "S527", "ignored-range", "a Range of a type that has none",
+    {{IGNORED_RANGE, "S527", "ignored-range", "a Range has no effect on this type",
       "A `Range` of a `String`, a `Binary`, an `RH`, an `SD` or an array of these is ignored.",
       "Remove the line. For strings, use `ValidStateValue`."},
      make_ignored_range},
-    {{NO_EXPRESSION, "S528", "no-expression", "what belongs to an Expression is without one",
+    {{NO_EXPRESSION, "S528", "no-expression", "a line has no effect without an Expression",
       "A dynamic attribute has a `ReArmExpression` or an `ExpressionDescription`, but no `Expression`. Or it has a "
       "`ReArmDescription`, but no `ReArmExpression`.",
       "Add the expression, or remove the line."},
@@ -149,8 +151,8 @@ constexpr row rows[] = {
       "Give the attribute a `GroupID` other than 255, and all attributes of a group the same `GroupName`."},
      make_group},
     {{UNUSED_VARIABLE_CLASS, "S530", "unused-variable-class", "a variable class is never used",
-      "No dynamic attribute names a `ResourceVariableClass` as its `VariableClass`. Not reported while a "
-      "`VariableClass` has an unknown name (S505), or a line of a dynamic attribute was not understood.",
+      "No dynamic attribute names a `ResourceVariableClass` as its `VariableClass`. Not reported if a "
+      "`VariableClass` has an unknown name (S505), or if a line of a dynamic attribute was not understood.",
       "Remove it, or give attributes its name."},
      make_unused_variable_class},
     {{INTERVALS, "S531", "intervals", "a variable class is reported more often than observed",
@@ -161,16 +163,16 @@ constexpr row rows[] = {
       "and `InvalForDefine`, or `ReqdForDefine` and `ReadOnly`.",
       "Remove one of them."},
      make_properties},
-    {{INVALID_DEFAULT, "S533", "invalid-default", "a default is not valid itself",
+    {{INVALID_DEFAULT, "S533", "invalid-default", "a default is not a valid value",
       "A `DefaultValue` or `InitialValue` is not among the valid values of its attribute, or is outside its `Range`. "
       "Without such a line, the default of the type is checked: 0 or an empty text, or one such element of an array. "
       "An attribute with `ReqdForDefine` is not checked, because it needs no default. Elements of structured "
       "data have no defaults of their own.",
       "Choose a default that is allowed, or allow it."},
      make_invalid_default},
-    {{CLASS_BIT, "S534", "class-bit", "an Id has the bit of class attributes",
-      "The `Id` of a dynamic attribute in a variable class has bit 0x8000, which is added there to the Ids of class "
-      "attributes to distinguish them from those of resources.",
+    {{CLASS_BIT, "S534", "class-bit", "an Id has the bit that marks class attributes",
+      "The `Id` of a dynamic attribute in a variable class has bit 0x8000 set. In variable classes, this bit "
+      "distinguishes the Ids of class attributes from those of resource attributes.",
       "Choose an `Id` below 32768."},
      make_class_bit},
     {{OUTER_BLANK, "S536", "outer-blank", "a text begins or ends with a blank",
@@ -181,7 +183,7 @@ constexpr row rows[] = {
     {{UNBALANCED, "S537", "unbalanced", "an expression lacks a parenthesis or a quote",
       "An `Expression` or `ReArmExpression` has a parenthesis or a quote without its partner. Characters after a "
       "backslash do not count.",
-      "Add the other one, or remove this one."},
+      "Add the missing character, or remove this one."},
      make_unbalanced},
     {{INCOMPLETE, "S515", "incomplete", "a stanza lacks required attributes",
       "A stanza lacks required attributes, which the compiler does not notice: their fields are 0. If an error in the "
@@ -200,32 +202,31 @@ constexpr row rows[] = {
     {{STRAY_RUN, "S518", "stray-run", "elements do not belong to what they follow",
       "`ActionInSDDefinition` or `ActionOutSDDefinition` comes where no action is open. `PAttrSDDefinition` follows a "
       "dynamic attribute, or `DAttrSDDefinition` a persistent one. Or elements of another kind directly follow "
-      "those of an attribute, which leaves open whose they are. Not reported if an error shows that a header is "
-      "missing.",
+      "those of an attribute, so that it is not defined what they belong to. Not reported if an error shows that a "
+      "header is missing.",
       "Put elements after what they belong to, and another stanza between two structures."},
      make_stray_run},
-    {{CUT_SHORT, "S514", "cut-short", "a second class ends an attribute unchecked",
+    {{CUT_SHORT, "S514", "cut-short", "a second class ends an attribute before it is checked",
       "A second `ControlDefinition` ends an open attribute as it is, without checks and defaults.",
       "Put each class in a file of its own."},
      make_cut_short},
     {{UNKNOWN_LOCATOR, "S504", "unknown-locator", "a Locator names no attribute",
-      "A `Locator` names no `PersistentResourceAttribute` of the last class. Not reported if such an attribute may "
-      "have "
-      "the name in a line or a stanza that was not understood.",
+      "A `Locator` names no `PersistentResourceAttribute` of the last class. Not reported if a line or a stanza that "
+      "was not understood may define such an attribute.",
       "Correct the name."},
      make_unknown_locator},
     {{UNKNOWN_VARIABLE_CLASS, "S505", "unknown-variable-class", "a VariableClass names no variable class",
       "A `VariableClass` names no `ResourceVariableClass`, so the attribute belongs to none. Reported "
-      "once for each name, where it is first given, and not while a `ResourceVariableClass` has no name that was "
-      "understood.",
+      "once for each name, where it is first given. Not reported if the name of a `ResourceVariableClass` is missing "
+      "or was not understood.",
       "Correct the name, or define the variable class."},
      make_unknown_variable_class},
     {{NO_NAME, "S601", "no-name", "a class is called after its database",
       "A class has no `Name`, so it is named after its database: the path up to `.cdef`, with the directory. "
-      "Only `cdef build` reports it, because it knows the database.",
+      "Only `cdef build` reports this, because `cdef check` does not know the name of the database.",
       "Give the `ResourceClass` a `Name`."},
      make_no_name},
-    {{SHARED_NAME, "S611", "shared-name", "two classes have one name",
+    {{SHARED_NAME, "S611", "shared-name", "two classes have the same name",
       "Two classes that are built together have the same name.", "Give one of them another name."},
      make_nothing},
     {{SHARED_KEYS, "S612", "shared-keys", "the keys of two classes overlap",
@@ -237,10 +238,9 @@ constexpr row rows[] = {
       "Two classes that are built together have the same `MessageCatalog`, and different `ResourceManager`s.",
       "Correct the name of one of them."},
      make_nothing},
-    {{OTHER_VARIABLE_CLASS, "S614", "other-variable-class", "two variable classes of one name differ",
+    {{OTHER_VARIABLE_CLASS, "S614", "other-variable-class", "two variable classes with the same name differ",
       "Two classes that are built together have a `ResourceVariableClass` of the same name, with different intervals "
-      "or "
-      "aliases.",
+      "or aliases.",
       "Make them alike, or give one of them another name."},
      make_nothing},
 };

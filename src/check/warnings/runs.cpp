@@ -97,7 +97,7 @@ public:
             look_for_action(see);
         else if (see.known.kind != NO_KIND && is_attribute_run(see.known.kind) && see.compiler.run_makes_value())
             advise(report(see, see.line.all(),
-                          "these elements directly follow those of an attribute: whose they are is not defined"),
+                          "these elements directly follow those of an attribute: what they belong to is not defined"),
                    "put a stanza of another kind between them");
         else if (is_attribute_run(next_kind))
             look_at_attribute(see, next_kind);

@@ -108,7 +108,7 @@ public:
                                ? "write `" + std::string(see.attr().ta_name) + "=\"" + std::string(whole) + "\"`"
                                : std::string("quote the value");
         place at = {value.line, end + 1, rest.size()};
-        report(see, at, "`" + sign + "` begins a comment here: stored is `" + std::string(see.value()) + "`",
+        report(see, at, "`" + sign + "` begins a comment here: only this is stored: `" + std::string(see.value()) + "`",
                {at, cure + ", or put a blank in front of a comment"});
     }
 
@@ -157,7 +157,7 @@ private:
         if (see.value().find(',') == std::string_view::npos || see.line.raw[at.column - 2] == '"')
             return;
         bool one = see.attr().ta_type == AT_INITIAL_VALUE;
-        report(see, at, "this is one element, with its commas",
+        report(see, at, "this whole line is one element, including its commas",
                {at, one ? "an `InitialValue` has one element; quote it if the commas belong to it"
                         : "write one " + name_of(see) + " line for each element, or quote a text with commas"});
     }

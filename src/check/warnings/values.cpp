@@ -36,7 +36,7 @@ public:
         bool known = std::any_of(std::begin(perm_list), std::end(perm_list),
                                  [&](const valid_perms_t &each) { return each.permission == text[0]; });
         if (!known)
-            report(see, at, "no permission has this letter, so that none is needed",
+            report(see, at, "no permission has this letter, so no permission is needed",
                    {at, "the letters are q, l, e, v, d, c, s, o, a and x"});
         else if (text.size() > 1)
             report(see, at, "only the first letter of a Permission counts");
@@ -108,7 +108,7 @@ private:
         if (name.empty())
             return;
         if (std::find(earlier.begin(), earlier.end(), name) != earlier.end())
-            return advise(report(see, at, "this property is given already"), "remove one of the two");
+            return advise(report(see, at, "this property has already been given"), "remove one of the two");
         for (std::string_view other : earlier)
             if (contradict(name, other))
                 return advise(report(see, at, language::quoted(name) + " contradicts " + language::quoted(other)),

@@ -322,10 +322,10 @@ def test_refuses_times_that_are_none(world):
 
 @pytest.mark.parametrize("arguments, message", [
     (("-o", "x", SOURCE, SOURCE), b"-o names one database, and there are 2 sources: use -d"),
-    (("-d", "d", "a/x.cdefsrc", "b/x.cdefsrc"), b"d/x.cdef: it would be made of a/x.cdefsrc and of b/x.cdefsrc"),
+    (("-d", "d", "a/x.cdefsrc", "b/x.cdefsrc"), b"d/x.cdef: it would be built from a/x.cdefsrc and from b/x.cdefsrc"),
     (("-d", "d", "-"), b"standard input has no name: name the database with -o"),
     (("-o", "-", "--format=json", SOURCE), b"-o - and --format json: both would be written to standard output"),
-    (("-o", "-", "--depfile=x", SOURCE), b"-o - and --depfile: standard output has no name that could depend on anything"),
+    (("-o", "-", "--depfile=x", SOURCE), b"-o - and --depfile: standard output has no name for which dependencies could be written"),
     (("-o", "x", "--byte-order=both", SOURCE), b"x: with --byte-order both, the database's name must end in .cdef"),
     (("empty",), b"empty: no sources in it (*.cdefsrc)"),
     (("-o", SOURCE, SOURCE), b"class.cdefsrc: cannot write: it is the source"),

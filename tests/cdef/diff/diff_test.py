@@ -576,7 +576,7 @@ def test_values_that_lead_to_one_text_too_often_are_refused(programs):
     lines = "".join(f"+ DynamicResourceAttribute 'A{i}'\n" for i in range(10, 1000))
     same(programs.diff("few.cdef", "many.cdef"), (1, lines, ""), "short names")
     # In JSON each path begins with the class's name.
-    message = "cdef: few.cdef, many.cdef: values or texts that lead to the same place too often\n"
+    message = "cdef: few.cdef, many.cdef: too many references lead to the same values or texts\n"
     same(programs.diff("--json", "few.cdef", "many.cdef"), (2, "", message), "a long name")
 
 

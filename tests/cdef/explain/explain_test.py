@@ -90,11 +90,11 @@ CMP206 = """CMP206: error: a property is gone
 
 Cause:
   Whoever relies on the older version is affected: clients may rely on the
-  property. It counts at the level `clients` and those after it.
+  property. The rule applies at the level `clients` and those after it.
 
 Cure:
-  Take the change back, or add something new beside what was there, unless
-  nobody relies on the older version in this way.
+  Take the change back, or add something new and keep the old. If nobody relies
+  on the older version in this way, the change is harmless.
 """
 
 

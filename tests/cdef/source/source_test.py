@@ -177,7 +177,7 @@ def on_terminal(programs, directory):
 def check_terminal(programs):
     """A terminal gets a source if there is nothing in it that the terminal would act on or hide."""
     text = (CASES / "canonical.cdefsrc").read_bytes()
-    refusal = f"cdef: {DATABASE}: the source has characters that are not for terminals: write it to a file\n".encode()
+    refusal = f"cdef: {DATABASE}: the source contains characters that could control a terminal: write it to a file\n".encode()
     shown = [text.encode() for text in ("plain", "é €\U0001f600", "e\u0301")]
     hidden = [b"\xe9", *(text.encode() for text in ("\x1b[1m", "\u202e", "\ufe0f"))]
     problems = []

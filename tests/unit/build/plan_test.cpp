@@ -85,9 +85,9 @@ TEST(Plan, RefusesNamesThatMakeNoSense) {
 
 TEST(Plan, RefusesTwoDatabasesOfOneName) {
     EXPECT_EQ(refusal({"a/x.cdefsrc", "b/x.cdefsrc"}, {.directory = "d"}),
-              "d/x.cdef: it would be made of a/x.cdefsrc and of b/x.cdefsrc");
+              "d/x.cdef: it would be built from a/x.cdefsrc and from b/x.cdefsrc");
     EXPECT_EQ(refusal({"a//x.cdefsrc", "a/./x.cdefsrc"}, {}),
-              "a/./x.cdef: it would be made of a//x.cdefsrc and of a/./x.cdefsrc");
+              "a/./x.cdef: it would be built from a//x.cdefsrc and from a/./x.cdefsrc");
     EXPECT_EQ(refusal({"x.cdefsrc", "b/x.cdefsrc"}, {}), "");
 }
 

@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Measure cdgen against other compilers, against what no program can beat, and against its targets; print one table.
+"""Measure cdgen against other compilers, lower limits and its own targets; print one table.
 
 Medians and ratios hold within one run only: machines are busy in different ways at different times.
 """
@@ -40,7 +40,7 @@ MB = 1e6
 
 
 class Plan(typing.NamedTuple):
-    """How much is measured."""
+    """The sizes and repetitions of a measurement."""
 
     small: int  # the two sizes between which growth is told
     large: int
@@ -55,7 +55,7 @@ QUICK = Plan(1000, 6000, 3, 5, 100, 4)
 
 
 class Verdict(typing.NamedTuple):
-    """A figure, the target it is held against, and whether it meets it."""
+    """A measured figure, its target, and whether it meets the target."""
 
     finding: str = ""
     target: str = ""
@@ -63,7 +63,7 @@ class Verdict(typing.NamedTuple):
 
 
 class Row(typing.NamedTuple):
-    """A line of the table; what has no meaning in it is None."""
+    """A row of the table; a cell that does not apply is None."""
 
     name: str
     size: typing.Optional[int] = None  # bytes of source
@@ -74,7 +74,7 @@ class Row(typing.NamedTuple):
 
 
 class Bench:
-    """The programs, the directory of their inputs, and the rows as they come in."""
+    """The programs, the directory of their inputs, and the rows so far."""
 
     def __init__(self, build, example, directory, plan):
         self.cdgen, self.cdef = build / "cdgen", build / "cdef"
@@ -85,11 +85,11 @@ class Bench:
         self.rows = []
 
     def add(self, *args, **kwargs):
-        """One more line of the table."""
+        """Adds a row to the table."""
         self.rows.append(Row(*args, **kwargs))
 
     def job(self, source, *options):
-        """cdgen on a source."""
+        """A run of cdgen on a source."""
         return self.here([self.cdgen, *options, source, "out.cdef"], fresh="out.cdef")
 
     def here(self, command, **more):
@@ -110,13 +110,13 @@ class Bench:
         return self.counted(self.job(source, *options))
 
     def counted(self, job):
-        """User instructions of a run."""
+        """The user instructions of a run."""
         counted = measure.counted_by_processor(job) if self.processor_counts() else None
         return counted or measure.counted_by_simulator(job)
 
     @functools.lru_cache(maxsize=None)
     def processor_counts(self):
-        """Whether the processor counts instructions here."""
+        """Whether the processor can count instructions on this machine."""
         return measure.counted_by_processor(self.here([self.empty])) is not None
 
     def output_size(self, source, *options):
@@ -126,7 +126,7 @@ class Bench:
 
 
 def say(text):
-    """Progress, away from the table."""
+    """Shows progress on standard error, outside of the table."""
     print(text, file=sys.stderr, flush=True)
 
 
@@ -162,7 +162,7 @@ def throughput(bench):
 
 
 def paired(bench, runs, others):
-    """How many times the CPU time of other runs some take, round by round: the least and the median."""
+    """The ratio of the CPU times of two groups of runs, round by round: its minimum and its median."""
     def by_round(costs):
         each = len(costs) // bench.plan.rounds
         return [statistics.median(cost.cpu for cost in costs[at:at + each]) for at in range(0, len(costs), each)]
@@ -172,7 +172,7 @@ def paired(bench, runs, others):
 
 
 def judge_throughput(bench, costs, sizes, runs):
-    """The targets of the mixed source."""
+    """Adds the targets for the mixed source."""
     source, count = bench.source(MIXED, bench.plan.large), f"{bench.plan.large:,} mixed attributes"
     per_byte = bench.instructions(source) / sizes["cdgen"]
     bench.add(f"instructions a byte, {count}", verdict=at_most(per_byte, 14, "{:.1f}"))
@@ -197,7 +197,7 @@ def judge_throughput(bench, costs, sizes, runs):
 
 
 def judge_largest(bench):
-    """Memory for a source of 1 GB, which is read once and then removed."""
+    """Adds the memory target for a source of 1 GB, which is read once and then removed."""
     say("a large source")
     path = bench.directory / "largest.cdefsrc"
     with open(path, "w", encoding="ascii") as file:
@@ -212,23 +212,23 @@ def judge_largest(bench):
 
 
 def at_most(figure, limit, form):
-    """A figure that must not exceed its target."""
+    """A verdict for a figure that must not exceed its target."""
     return Verdict(form.format(figure), f"<= {limit}", figure <= limit)
 
 
 def at_least(figure, limit, form):
-    """A figure that must reach its target."""
+    """A verdict for a figure that must reach its target."""
     return Verdict(form.format(figure), f">= {limit}", figure >= limit)
 
 
 def memory(peak, output):
-    """Peak memory against the size of what is written."""
+    """A verdict for peak memory compared with the size of the output."""
     finding = f"{peak / MB:.1f} MB for {output / MB:.1f} MB"
     return Verdict(finding, "<= 2.2 x output + 2 MB", peak <= 2.2 * output + 2 * MB)
 
 
 def readers(bench):
-    """What reads databases, against their size: for each byte, less than a nanosecond."""
+    """Measures the programs that read databases; the target is less than a nanosecond for each byte."""
     say("verifying and reading")
     source = bench.source(MIXED, bench.plan.large)
     size = bench.output_size(source)
@@ -254,7 +254,8 @@ def earlier_instructions():
 
 
 def inspector(bench):
-    """What shows databases, against what it took before: instructions, and memory for a byte of database."""
+    """Compares the subcommands that show databases with their recorded figures: instructions, and memory for each byte.
+    """
     say("showing")
     size, earlier = (bench.directory / "read.cdef").stat().st_size, earlier_instructions()
     databases = {name: ["read.cdef"] * (2 if name == "diff" else 1) for name in INSPECTED}
@@ -267,7 +268,7 @@ def inspector(bench):
 
 
 def checks(bench):
-    """cdef check against compiling, dimension by dimension."""
+    """Compares cdef check with compiling, for each dimension."""
     say("checking")
     for dimension in (MIXED, "actions", "SD elements of one run"):
         source = bench.source(dimension, bench.plan.large)
@@ -280,7 +281,7 @@ def checks(bench):
 
 
 def start_up(bench):
-    """A small compilation against a program that does nothing."""
+    """Compares a small compilation with a program that does nothing."""
     say("start-up")
     jobs = [job._replace(repeat=bench.plan.start_runs) for job in (bench.here([bench.empty]), bench.job(bench.example))]
     costs = bench.launcher.rounds(dict(enumerate(jobs)), bench.plan.start_rounds)
@@ -297,14 +298,14 @@ def start_up(bench):
 
 
 def exponent(bench, dimension, *options):
-    """How instructions grow between the two sizes, without what one of the kind costs."""
+    """The exponent with which instructions grow between the two sizes, without the cost of a source with only one."""
     base, small, large = (bench.instructions(bench.source(dimension, count), *options)
                           for count in (1, bench.plan.small, bench.plan.large))
     return math.log((large - base) / (small - base)) / math.log(bench.plan.large / bench.plan.small)
 
 
 def grow(bench, dimension):
-    """One dimension: its cost at the larger size, and its growth; returns what to say of its memory."""
+    """Measures one dimension: its cost at the larger size, and its growth. Returns the verdict about its memory."""
     say(f"growth: {dimension}")
     source = bench.source(dimension, bench.plan.large)
     runs = bench.launcher.runs(bench.job(source))
@@ -317,7 +318,7 @@ def grow(bench, dimension):
 
 
 def growth(bench):
-    """All dimensions; their memory in rows of their own, as it has a target too."""
+    """Measures all dimensions. Their memory has a target and therefore rows of its own."""
     verdicts = {dimension: grow(bench, dimension) for dimension in GROWTH}
     for dimension, verdict in verdicts.items():
         bench.add(f"peak memory, {bench.plan.large:,} {dimension}", verdict=verdict)
@@ -350,7 +351,7 @@ def table(rows, costs):
 
 
 def machine():
-    """What was measured on."""
+    """A description of the machine."""
     try:
         text = pathlib.Path("/proc/cpuinfo").read_text(encoding="ascii", errors="replace")
         model = next(line.split(":")[1].strip() for line in text.splitlines() if line.startswith("model name"))
@@ -363,21 +364,21 @@ BEGIN, END = "<!-- what script/bench --record wrote -->\n", "<!-- end -->\n"
 
 
 def record(path, text):
-    """Puts the table into a document, in place of the one that is there."""
+    """Replaces the table in a document."""
     document = path.read_text(encoding="utf-8")
     before, rest = document.split(BEGIN)
     path.write_text(before + BEGIN + text + "\n" + END + rest.split(END)[1], encoding="utf-8")
 
 
 def report(bench, costs, quick):
-    """What was measured on, and the table."""
+    """The description of the machine, and the table."""
     counter = "the processor" if bench.processor_counts() else "valgrind"
     head = f"{machine()}; instructions counted by {counter}; {bench.plan.large:,} definitions"
     return head + ("; QUICK: rough figures" if quick else "") + "\n\n" + table(bench.rows, costs)
 
 
 def run(bench):
-    """Everything; the costs that ratios refer to."""
+    """Runs everything. Returns the costs that the ratios refer to."""
     costs, sizes, runs = throughput(bench)
     judge_throughput(bench, costs, sizes, runs)
     judge_largest(bench)
@@ -390,7 +391,7 @@ def run(bench):
 
 
 def parse():
-    """The command line."""
+    """Parses the command line."""
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--quick", action="store_true", help="small inputs and few runs: only to try it out")
     parser.add_argument("--record", action="store_true", help="put the table into the document too")

@@ -92,7 +92,7 @@ TYPES = tuple(VALUES)
 
 
 def definitions(count):
-    """The attributes of a mixed source, and of the inputs that other compilers get in its stead."""
+    """The attributes of a mixed source. The inputs of other compilers are made from the same definitions."""
     for index in range(count):
         data_type = TYPES[index % len(TYPES)]
         low, high, default = VALUES[data_type](index)
@@ -140,7 +140,7 @@ def attributes(count, _length):
 
 
 def actions(count, _length):
-    """Actions of both kinds, turn by turn."""
+    """Actions of both kinds, alternating."""
     for index in range(count):
         yield (f"{('ResourceAction', 'ClassAction')[index % 2]}\n\tName=Action_{100000 + index}\n"
                f"\tDescription={message(index)}\n\tDisplayName={message(index + 1)}\n\tId={100000 + index}\n"
@@ -199,7 +199,7 @@ def variable_classes(count, _length):
 
 
 def members(count, classes):
-    """Dynamic attributes that name the last variable classes, turn by turn."""
+    """Dynamic attributes that name the last variable classes in turn."""
     for index, definition in enumerate(definitions(count)):
         group = 100000 + classes - 1 - index % min(classes, LISTED_CLASSES_MAX)
         yield dynamic("DynamicResourceAttribute", definition) + f"\tVariableClass=Group_{group}\n"
@@ -230,7 +230,7 @@ def large_source(classes, each):
 
 
 def source(classes=1, members_count=0, string_length=STRING_LENGTH, **counts):
-    """The pieces of a source; all but the classes' heads belong to the last class."""
+    """The parts of a source. Everything except the heads of the classes belongs to the last class."""
     for index in range(classes):
         yield HEAD.format(name=f"Class_{100000 + index}")
     for name, write in DIMENSIONS.items():
@@ -241,7 +241,7 @@ def source(classes=1, members_count=0, string_length=STRING_LENGTH, **counts):
 
 
 def number(text):
-    """A count of the command line."""
+    """Parses a count from the command line."""
     value = int(text)
     if value < 0:
         raise argparse.ArgumentTypeError("must not be negative")
@@ -249,7 +249,7 @@ def number(text):
 
 
 def parse():
-    """The command line."""
+    """Parses the command line."""
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     for name in DIMENSIONS:
         parser.add_argument(f"--{name.replace('_', '-')}", type=number, default=0, metavar="N")

@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Count the instructions of some compilations and hold them against the recorded ones.
+"""Count the instructions of some compilations and compare them with the recorded counts.
 
 Counts do not depend on how busy a machine is, and hardly on which it is: the
 program is static, the simulated processor is told to look like the plainest
@@ -35,13 +35,13 @@ HEADING = """\
 
 
 def toolchain():
-    """What the figures depend on beside the sources."""
+    """The versions of the compiler and the C library, which the counts depend on."""
     compiler = subprocess.run(["c++", "-dumpfullversion"], capture_output=True, text=True, check=True).stdout.strip()
     return f"{platform.machine()}, c++ {compiler}, {' '.join(platform.libc_ver())}"
 
 
 def sources(directory, example):
-    """The sources by name, written where they are generated."""
+    """The sources by name; generated ones are written first."""
     paths = {"example": example}
     for name, counts in SOURCES.items():
         paths[name] = directory / f"{name}.cdefsrc"
@@ -51,7 +51,7 @@ def sources(directory, example):
 
 
 def count(cdgen, example):
-    """Instructions by the name of the source, both byte orders."""
+    """The instructions by the name of the source, for both byte orders."""
     figures = {}
     with tempfile.TemporaryDirectory(prefix="cdgen-guard-") as name:
         directory = pathlib.Path(name)
@@ -63,13 +63,13 @@ def count(cdgen, example):
 
 
 def write(path, figures):
-    """The record."""
+    """Writes the record."""
     lines = [f"{name:<14}{figure:>12}\n" for name, figure in figures.items()]
     path.write_text(f"{HEADING}# {toolchain()}\n{''.join(lines)}", encoding="ascii")
 
 
 def read(path):
-    """The recorded figures, and what they were recorded with."""
+    """Reads the record: the counts, and the versions that they were made with."""
     lines = path.read_text(encoding="ascii").splitlines()
     recorded = (line.rsplit(maxsplit=1) for line in lines if not line.startswith("#"))
     comments = [line[2:] for line in lines if line.startswith("#")]
@@ -77,7 +77,7 @@ def read(path):
 
 
 def compare(recorded, figures):
-    """Prints all figures; whether none has grown too much."""
+    """Prints all counts. Returns whether none has grown too much."""
     good = True
     for name, figure in figures.items():
         change = figure / recorded[name] - 1
@@ -88,7 +88,7 @@ def compare(recorded, figures):
 
 
 def parse():
-    """The command line."""
+    """Parses the command line."""
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--renew", action="store_true", help="record the counts instead of comparing them")
     parser.add_argument("--cdgen", type=pathlib.Path, required=True)
@@ -98,7 +98,7 @@ def parse():
 
 
 def main():
-    """Count, then compare or record."""
+    """Counts, then compares with the record or replaces it."""
     options = parse()
     figures = count(options.cdgen.resolve(), options.example.resolve())
     if options.renew:

@@ -1,4 +1,4 @@
-"""What a run of a program costs: time and memory, user instructions, system calls."""
+"""Measure the cost of running a program: time and memory, user instructions, system calls."""
 
 import os
 import pathlib
@@ -44,11 +44,11 @@ class Cost(typing.NamedTuple):
 
 
 class Failure(Exception):
-    """A program that was to be measured did not do its work."""
+    """A program that was to be measured has failed."""
 
 
 def check(result, command):
-    """A run that failed has no cost."""
+    """Raises Failure if a run has failed."""
     if result.returncode != 0:
         detail = result.stderr.decode(errors="replace").strip()[-500:]
         raise Failure(f"{' '.join(map(str, command))}: status {result.returncode}: {detail}")

@@ -44,7 +44,7 @@ def quoted(text):
 
 
 def begin_group(index, end, begin):
-    """What stands in front of a definition where definitions come in groups."""
+    """The text in front of a definition in an input that is divided into groups."""
     if index % GROUP == 0:
         yield end if index else ""
         yield begin

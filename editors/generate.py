@@ -32,7 +32,7 @@ def read_names(program):
 
 
 def longest_first(names):
-    """So that no name hides a longer one that begins with it."""
+    """Sorts names so that none hides a longer name that begins with it."""
     return sorted(names, key=lambda name: (-len(name), name))
 
 
@@ -86,7 +86,7 @@ let b:current_syntax = "cdefsrc"
 
 
 def vim_syntax(stanzas, words):
-    """Attributes are known inside their stanza only, so that a misspelt or misplaced one shows."""
+    """Attributes are recognised only inside their stanza, so that misspelled and misplaced ones stand out."""
     lines = [VIM_HEAD]
     lines.append(f"syn match cdefUnknownStanza /^{VIM_HEADER}.*$/ contains=cdefComment")
     lines.append(rf"syn match cdefUnknownAttribute /^[ \t]\+\zs{VIM_NAME}\ze{VIM_VALUED}/ contained")
@@ -116,7 +116,7 @@ def vim_syntax(stanzas, words):
 
 
 def textmate_stanza(stanza, attributes):
-    """From the header to the next one."""
+    """A stanza extends from its header to the next header."""
     names = "|".join(longest_first(attributes))
     return {
         "name": f"meta.stanza.{stanza.lower()}.cdefsrc",

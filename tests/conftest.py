@@ -11,7 +11,7 @@ from programs import PROGRAMS, PROJECT  # noqa: E402  (after the registration)
 
 
 def pytest_addoption(parser):
-    """Options of our own."""
+    """Adds the options of this project."""
     group = parser.getgroup("cdgen")
     group.addoption("--build", default=PROJECT / "build/test", help="the build directory whose programs are tested")
     group.addoption("--cdgen", help="another compiler to test than the build's")
@@ -24,7 +24,7 @@ def pytest_addoption(parser):
 
 
 def pytest_configure(config):
-    """Before any test is collected."""
+    """Finds the programs before any test is collected."""
     PROGRAMS.use(config.getoption("build"), config.getoption("cdgen"), config.getoption("native"))
     PROGRAMS.cases, PROGRAMS.round = config.getoption("cases"), config.getoption("round")
     there = config.getoption("there")
@@ -35,12 +35,12 @@ def pytest_configure(config):
 
 
 def pytest_ignore_collect(collection_path):
-    """What needs another machine's compiler."""
+    """Ignores tests that need a compiler for another machine."""
     return True if collection_path.name == "cross_endian_test.py" and PROGRAMS.there is None else None
 
 
 def pytest_collection_modifyitems(items):
-    """The slow ones first, so that the last ones to end are quick."""
+    """Puts slow tests first, so that the last ones to finish are quick."""
 
     def seconds(item):
         mark = item.get_closest_marker("slow")

@@ -27,7 +27,7 @@ SECTION_COUNT = 24  # its offset in the header
 
 
 def write_source(directory):
-    """A source of empty classes."""
+    """Writes a source of empty classes."""
     source = directory / "source"
     with source.open("w") as file:
         file.writelines("ControlDefinition\n" for _ in range(RECORDS))
@@ -55,7 +55,7 @@ def empty_anchors(directory):
 
 @pytest.mark.slow(10)
 def test_compile(directory):
-    """Of each class, little more than its record is kept; the map is not there, so that there is no image."""
+    """For each class, little more than its record is kept. There is no map, so no image is made."""
     classes = max(RECORDS, 300_000)  # so many that the interpreter, which the program is forked from, is smaller
     source = directory / "source"
     source.write_text("ControlDefinition\n" * classes)
@@ -72,7 +72,7 @@ def test_compile(directory):
 @pytest.mark.slow(10)
 @pytest.mark.parametrize(("form", "mark"), [("text", b"too many to say which follow"), ("json", b'"diagnosed": false')])
 def test_verify_many_findings(directory, form, mark):
-    """Each anchor says that its section is at 0. With so many findings, nothing is said of causes."""
+    """Each anchor places its section at 0. With so many findings, no causes are shown."""
     path = empty_anchors(directory)
     status, out, errors = run_bounded(directory, [PROGRAMS.cdef, "verify", "--format", form], path)
     assert (status, errors) == (1, b"")
@@ -88,7 +88,7 @@ def test_verify_many_findings(directory, form, mark):
 @pytest.mark.parametrize(("form", "mark"), [
     ("sarif", b'"ruleId":"CDB203"'), ("github", b",title=CDB203::"), ("gitlab", b'"check_name": "CDB203"')])
 def test_verify_many_findings_for_services(directory, form, mark):
-    """Each is one of its own, with a fingerprint of its own where there are fingerprints."""
+    """Each finding is separate, with its own fingerprint if the form has fingerprints."""
     path = empty_anchors(directory)
     status, out, errors = run_bounded(directory, [PROGRAMS.cdef, "verify", "--format", form], path)
     assert (status, errors) == (1, b"")
@@ -112,14 +112,14 @@ def test_dump(directory, form):
 
 @pytest.mark.slow(10)
 def test_dump_damaged(directory):
-    """What is not sound is shown too."""
+    """hex also shows a file that is not sound."""
     path = empty_anchors(directory)
     assert run_bounded(directory, [PROGRAMS.cdef, "dump", "--format=hex"], path)[0] == 0
 
 
 @pytest.mark.slow(10)
 def test_verify_sound(directory):
-    """Nothing is found."""
+    """There are no findings."""
     path = empty_classes(directory, "classes")
     status, out, errors = run_bounded(directory, [PROGRAMS.cdef, "verify"], path)
     assert (status, out.read_bytes(), errors) == (0, b"", b"")
@@ -128,7 +128,7 @@ def test_verify_sound(directory):
 @pytest.mark.slow(10)
 @pytest.mark.parametrize("form", ["text", "json"])
 def test_diff(directory, form):
-    """All classes have another name."""
+    """All classes have different names."""
     before, after = empty_classes(directory, "before"), empty_classes(directory, "after")
     status, out, errors = run_bounded(directory, [PROGRAMS.cdef, "diff", "--format", form], before, after)
     assert (status, errors) == (1, b"")

@@ -1,4 +1,5 @@
-"""Ask each subcommand whose a list of valid values or a bound is, where the reference does not say.
+"""Test that all subcommands agree about the owner of a list of valid values or of a bound, if the reference does not
+show it.
 
 An attribute that a following class cuts short refers to the first list of
 valid values, whether it has that list or none.  Each case is a class that
@@ -74,7 +75,7 @@ def element(kind, name, data_type, *more):
 
 @dataclasses.dataclass
 class Case:
-    """A class, and what is known of its valid values."""
+    """A class, and the expected owners of its valid values."""
 
     stanzas: list
     values: dict  # name of an attribute or element: its valid values, as dump and source have them
@@ -209,14 +210,14 @@ class Programs:
         self.directory = directory
 
     def compile(self, stanzas, name, *options, following=CLASS.format("Second")):
-        """Compile the stanzas as the first of two classes, or with nothing following as the only one."""
+        """Compiles the stanzas as the first of two classes, or as the only class."""
         text = CLASS.format("First") + "".join(stanzas) + following + MAP
         (self.directory / "source").write_text(text)
         command = [PROGRAMS.cdgen, *options, "source", name]
         subprocess.run(command, cwd=self.directory, check=True, capture_output=True, timeout=TIMEOUT)
 
     def cdef(self, *arguments):
-        """What a subcommand writes."""
+        """The output of a subcommand."""
         command = [PROGRAMS.cdef, *arguments]
         result = subprocess.run(command, cwd=self.directory, check=False, capture_output=True, timeout=TIMEOUT)
         same(result.stderr, b"", *arguments)
@@ -263,7 +264,7 @@ def owners_in(source):
 @pytest.mark.parametrize("options", ([], ["-s"]), ids=("native", "reversed"))
 @pytest.mark.parametrize("name", CASES)
 def test_all_subcommands_name_the_owner(name, options, directory):
-    """Of each list, in both byte orders."""
+    """For each list, in both byte orders."""
     case, programs = CASES[name], Programs(directory)
     programs.compile(case.stanzas, "made.cdef", *options)
     records = list(records_of(json.loads(programs.cdef("dump", "--json", "--offsets", "made.cdef"))))
@@ -292,7 +293,7 @@ BOUNDS = {
 
 
 def bounds_in(listing):
-    """What a listing says of the bounds of d0."""
+    """The bounds of d0 in a listing."""
     start = listing.index('dynamic resource attribute "d0"')
     found = re.search(r"ra_min_value: (.*?)\n *u_ra_variety_list", listing[start:], re.DOTALL)
     return re.sub(r"ra_max_value: ", "", found[1]).split("\n")
@@ -301,7 +302,7 @@ def bounds_in(listing):
 @pytest.mark.parametrize("order", ("little", "big"))
 @pytest.mark.parametrize("name", BOUNDS)
 def test_dump_and_diff_take_a_bound_for_none(name, order, directory):
-    """If verify says that it is not the attribute's own."""
+    """If verify reports that the bound is not the attribute's own."""
     shown, changed = BOUNDS[name]
     programs = Programs(directory)
     before, after = PROGRAMS.images / f"small.{order}.cdef", PROGRAMS.images / f"broken/{name}.{order}.cdef"

@@ -42,27 +42,27 @@ def images():
 
 
 def test_schemas():
-    """They are schemas, and each subcommand that writes JSON has one."""
+    """They are valid schemas, and each subcommand that writes JSON has one."""
     same(sorted(SCHEMAS), [f"cdef-{name}.schema.json" for name in ("check", "diff", "dump", "explain", "verify")], "names")
     for schema in SCHEMAS.values():
         jsonschema.Draft7Validator.check_schema(schema)
 
 
 def test_check():
-    """All sources of the cases, and names of nothing."""
+    """The sources of all cases, and names of files that do not exist."""
     sources = sorted(CASES.glob("*.cdefsrc"))
     data = document("check", "--format", "json", *sources, "none.cdefsrc", ".")
     same((data["schema"], len(data["sources"])), ("cdef-check.schema.json", len(sources) + 2), "schema, sources")
 
 
 def test_verify():
-    """All images, sound or not, and names of nothing."""
+    """All images, sound or not, and names of files that do not exist."""
     data = document("verify", "--format", "json", *images(), "none.cdef", CASES / "disk.cdefsrc")
     same((data["schema"], len(data["files"])), ("cdef-verify.schema.json", len(images()) + 2), "schema, files")
 
 
 def test_explain():
-    """All codes, and some."""
+    """All codes, and some of them."""
     data = document("explain", "--format", "json")
     same((data["schema"], data["codes"][0]["code"]), ("cdef-explain.schema.json", "S101"), "schema, first code")
     data = document("explain", "--json", "CDB104", "octal")
@@ -71,7 +71,7 @@ def test_explain():
 
 @pytest.mark.parametrize("options", [(), ("--offsets",)])
 def test_dump(options):
-    """All images that are sound."""
+    """All sound images."""
     shown = 0
     for name in images():
         if subprocess.run([PROGRAMS.cdef, "verify", name], cwd=PROGRAMS.images, capture_output=True).returncode == 0:
@@ -81,7 +81,7 @@ def test_dump(options):
 
 
 def test_diff(tmp_path):
-    """Two of the examples, of which everything differs, and two images of which a field does."""
+    """Two of the examples, which differ completely, and two images that differ in one field."""
     one, two = (compiled(name, tmp_path) for name in ("Process", "ClusterNode"))
     for options in ((), ("--compat",)):
         data = document("diff", "--format", "json", *options, one, two)
@@ -102,7 +102,7 @@ def test_diff(tmp_path):
     lambda data: data["sources"][0]["findings"][0].pop("notes"),
 ])
 def test_strict(change):
-    """What does not follow the schema is noticed."""
+    """The schemas refuse documents that do not follow them."""
     data = copy.deepcopy(document("check", "--json", CASES / "json.cdefsrc"))
     change(data)
     assert not jsonschema.Draft7Validator(SCHEMAS["cdef-check.schema.json"]).is_valid(data)

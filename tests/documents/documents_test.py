@@ -15,7 +15,7 @@ WITH_SOURCES = {"README.md", "language.md", "format.md", "cdgen.1", "cdefsrc.5",
 
 
 def made_by(script, *arguments):
-    """What a script writes to an empty directory: name -> contents."""
+    """The files that a script writes to an empty directory: name -> contents."""
     with tempfile.TemporaryDirectory() as place:
         for directory in ("vim/syntax", "vscode/syntaxes"):
             (pathlib.Path(place) / directory).mkdir(parents=True)
@@ -53,7 +53,7 @@ class Sources(unittest.TestCase):
                 self.compile(path.read_text())
 
     def expect_no_warning(self, *files, shown=()):
-        """But those of codes that the page shows itself."""
+        """Except for the codes that the page itself shows."""
         excused = [word for code in shown for word in ("--no-warn", code)]
         done = subprocess.run([PROGRAMS.cdef, "check", "--no-config", "--werror", *excused, *files],
                               capture_output=True, text=True)
@@ -81,7 +81,7 @@ class Sources(unittest.TestCase):
 
 
 class Tables(unittest.TestCase):
-    """What becomes of a document's tables on its page."""
+    """The tables of a document on its manual page."""
 
     def shown(self, cell):
         """A cell as the page has it, without fonts."""
@@ -115,7 +115,7 @@ class Links(unittest.TestCase):
 
 class Release(unittest.TestCase):
     def found(self, name, expression):
-        """What the expression's group is in a file, which is there once."""
+        """The text that the expression's group matches in a file, exactly once."""
         (value,) = re.findall(expression, (PROJECT / name).read_text(), re.M)
         return value
 

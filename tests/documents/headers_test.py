@@ -1,4 +1,4 @@
-"""What the headers of the reader say to a compiler that is not set to C++20."""
+"""Test what the headers of the reader report if the compiler is not set to C++20."""
 
 import subprocess
 

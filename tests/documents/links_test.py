@@ -1,4 +1,4 @@
-"""What script/links says of a site."""
+"""Test what script/links reports about a site."""
 
 import subprocess
 import sys
@@ -18,13 +18,13 @@ def checked(directory, **pages):
 
 
 def test_is_content_with_links_that_lead_somewhere(directory):
-    """To a place of another page, to one of this page, and from the root of the site."""
+    """To a place in another page, to one in this page, and from the root of the site."""
     two = '<a name="place" href="#place"></a> <a href="/one.html#top"></a> <a href="."></a>'
     assert checked(directory, one=PAGE, two=two) == (0, "2 pages, 5 links, 0 broken\n")
 
 
 def test_names_links_that_lead_nowhere(directory):
-    """A page that is missing, a place that is missing, and a file outside of the site."""
+    """A missing page, a missing place, and a file outside of the site."""
     two = '<a href="three.html"></a> <a href="../outside.html"></a>'
     status, said = checked(directory, one=PAGE, two=two)
     assert status == 1
@@ -33,5 +33,5 @@ def test_names_links_that_lead_nowhere(directory):
 
 
 def test_refuses_a_site_without_pages(directory):
-    """Nothing was built."""
+    """Such a site has not been built."""
     assert checked(directory)[0] == 1

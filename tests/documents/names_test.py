@@ -1,4 +1,5 @@
-"""Holds the names in the documents and the manual pages against those that the compiler and the format have.
+"""Compares the names in the documents and manual pages with those that the compiler and the format have, as the program
+tests/support/list_names.cpp lists them.
 
 They come from the program tests/support/list_names.cpp.
 """
@@ -33,7 +34,7 @@ def read_names(program):
 
 
 def known_fields(names):
-    """record -> fields, those of entries with the record that they follow."""
+    """record -> fields; those of entries are listed with the record before them."""
     found = collections.defaultdict(list)
     for record, field in names["field"]:
         if field not in ARRAYS:
@@ -53,7 +54,7 @@ class Language(Names):
     """docs/language.md"""
 
     def stanza_chapters(self):
-        """The chapters about stanzas: whose they are, and their rows about attributes."""
+        """The chapters about stanzas: the names of their stanzas, and the rows about attributes."""
         found = {}
         for title, text in chapters(LANGUAGE, 3):
             rows = [row for table in tables(text) if table[0][0] == "attribute" for row in table]
@@ -64,7 +65,7 @@ class Language(Names):
         return found
 
     def said_of(self, rows, earlier):
-        """attribute -> (required, repeats, form), as the rows say; 'as above' stands for another stanza's."""
+        """attribute -> (required, repeats, form), from the rows; 'as above' means the row of another stanza."""
         head, said = rows[0], {}
         for row in rows[1:]:
             cell = dict(zip(head, row))
@@ -91,16 +92,16 @@ class Language(Names):
         self.assertEqual(sorted(listed), sorted(stanza for (stanza,) in self.names["stanza"]))
 
     def words(self, first):
-        """The table of the chapter "Names" whose first heading that is, without its headings."""
+        """The rows of the table in the chapter "Names" that has this first heading."""
         (found,) = [rows for head, *rows in tables(dict(chapters(LANGUAGE, 2))["Names"]) if head[0] == first]
         return found
 
     def meanings(self, of):
-        """name -> meaning, of those that the program lists under a word."""
+        """name -> meaning, for the names that the program lists under a word."""
         return {name: " ".join(text) for kind, name, *text in self.names["meaning"] if kind == of and text}
 
     def test_each_attribute_has_its_meaning(self):
-        """The documents, and what editors show, have the same words."""
+        """The documents and the texts that editors show use the same words."""
         earlier = {}
         for stanza, rows in self.stanza_chapters().items():
             said = {}
@@ -152,7 +153,7 @@ class Format(Names):
     """docs/format.md"""
 
     def said(self):
-        """record -> fields, of chapters whose heading names a record."""
+        """record -> fields, from the chapters whose headings name a record."""
         found = {}
         for title, text in chapters(FORMAT, 3):
             for record in re.findall(r"`(\w+_t)`", title):
@@ -172,7 +173,7 @@ class Format(Names):
 
 
 class Pages(Names):
-    """The manual pages, which their readers may have nothing else than."""
+    """The manual pages, which may be all that their readers have."""
 
     def missing(self, page, names):
         text = text_of(PROJECT / "man" / page)
@@ -195,7 +196,7 @@ class Pages(Names):
             self.assertEqual({f"{name}.{section}" for name, section in named}, others, page)
 
     def test_whole_class_has_every_form_of_stanza(self):
-        """Who knows nothing but the page finds a complete class in it."""
+        """A reader who has only the page finds a complete class in it."""
         most = max(sources(PROJECT / "man/cdefsrc.5"), key=len)
         used = set(re.findall(r"^[A-Z]\w+", most, re.M))
         for wanted in ("ControlDefinition", "ResourceClass", "ResourceVariableClass", "PersistentResourceAttribute",

@@ -25,7 +25,7 @@ WARNINGS = "-Wall -Wextra -Werror"
 
 
 def programs(directory):
-    """Make a directory with all that the commands call and the system does not have."""
+    """Makes a directory of the programs that the commands use and the system does not have."""
     directory.mkdir()
     for program in (PROGRAMS.cdgen, PROGRAMS.cdef):
         (directory / program.name).symlink_to(program)
@@ -40,7 +40,7 @@ def programs(directory):
 
 
 def commands(block):
-    """Each command of a console block with the lines that it is to print."""
+    """Each command of a console block, with its expected output."""
     found = []
     for line in block.splitlines():
         if line.startswith("$ "):
@@ -51,7 +51,7 @@ def commands(block):
 
 
 def agrees(expected, printed):
-    """True if the output is that of the document; `...` stands for any lines."""
+    """True if the output matches the lines of the document; `...` matches any lines."""
     pattern = "".join(r"(?:.*\n)*?" if line == "..." else re.escape(line + "\n") for line in expected)
     return re.fullmatch(pattern, printed) is not None
 

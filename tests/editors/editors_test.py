@@ -21,20 +21,20 @@ MESSAGE = "Attribute name not defined in table (name/table): DescrResourceClass"
 
 @pytest.fixture
 def place(directory):
-    """A directory with the source, and a home without anybody's settings."""
+    """A directory with the source, and an empty home directory."""
     (directory / "pump.cdefsrc").write_text(BEFORE)
     (directory / "home").mkdir()
     return directory
 
 
 def environment(place):
-    """The program cdef is found by its name."""
+    """The environment, in which the program cdef is on the PATH."""
     return {**os.environ, "HOME": str(place / "home"), "XDG_CONFIG_HOME": str(place / "home"), "TERM": "dumb",
             "XDG_DATA_HOME": str(place / "home"), "PATH": f"{PROGRAMS.build}:{os.environ['PATH']}", "LC_ALL": "C.UTF-8"}
 
 
 class Neovim:
-    """One that runs without a screen, in the home, and is typed into."""
+    """A Neovim without a screen, into which the test types."""
 
     def __init__(self, place):
         self.place = place

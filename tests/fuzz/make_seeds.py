@@ -34,7 +34,7 @@ MORE_WORDS = (
 
 
 def sources():
-    """All texts that are worth beginning with."""
+    """The texts of all sources that are used as seeds."""
     for path in sorted(TESTS.rglob("*.cdefsrc")):
         yield path.read_bytes()
     for seed in range(GENERATED):
@@ -42,7 +42,7 @@ def sources():
 
 
 def compile_source(command, directory, text, name):
-    """Writes a source's databases, if it has any."""
+    """Writes the databases of a source if it compiles."""
     source = directory / "text"
     source.write_bytes(text)
     for suffix, option in (("", []), ("-turned", ["-s"])):
@@ -111,7 +111,7 @@ def escaped(word):
 
 
 def words(command):
-    """Every word of the language, with the characters around it."""
+    """Every word of the language, with the characters that can surround it."""
     listed = subprocess.run(command, capture_output=True, text=True, check=True).stdout
     for line in listed.splitlines():
         what, *rest = line.split()
@@ -127,7 +127,7 @@ def words(command):
 
 
 def main():
-    """Write everything."""
+    """Writes all seeds and dictionaries."""
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--cdgen", type=pathlib.Path, required=True)
     parser.add_argument("--list-names", type=pathlib.Path, required=True)

@@ -1,4 +1,4 @@
-"""What the fuzzers begin with and what they ever found, replayed."""
+"""Replays the seeds of the fuzzers, and all inputs with which they have found defects."""
 
 import subprocess
 
@@ -12,7 +12,7 @@ FOUND = [what for what in FUZZERS if any((TESTS / "fuzz/found" / what).glob("*")
 
 
 def replay(what, directory):
-    """Give a fuzz target all files of a directory."""
+    """Passes all files of a directory to a fuzz target."""
     assert any(directory.iterdir()), f"nothing in {directory}"
     command = [*runner(), PROGRAMS.build / "tests/fuzz" / f"{what}_fuzz", directory]
     done = subprocess.run(command, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, timeout=1800, check=False)

@@ -1,4 +1,4 @@
-"""Hold this machine's cdgen and one of the other byte order against each other.
+"""Compares this machine's cdgen with one for the other byte order.
 
 For every source: the same exit status, messages and traces, with and without
 option s; and the file that one machine writes is, byte for byte, the file that
@@ -23,7 +23,7 @@ SOURCES = [path for directory in (TESTS / "golden", TESTS / "twins", EXAMPLES) f
 
 
 def load(path):
-    """The case of an expectation, or of a source alone, of which nothing is expected."""
+    """The case of an expectation, or of a source without one."""
     return golden.Case(path) if path.exists() else golden.Source(path)
 
 
@@ -44,7 +44,7 @@ def left_alone(case, order):
 
 
 def differences(case, here, there):
-    """The differences between a run on each machine that ought to be alike."""
+    """The differences between runs on the two machines that must have equal results."""
     outcome, written = run(case, PROGRAMS.cdgen, "", here)
     other_outcome, other_written = run(case, PROGRAMS.there, PROGRAMS.runner, there)
     problems = []
@@ -63,6 +63,6 @@ def differences(case, here, there):
 
 @pytest.mark.parametrize("path", SOURCES, ids=lambda path: path.stem)
 def test_same_on_both(path):
-    """What each machine makes of a source, with option s on either."""
+    """The results for a source on each machine, with option s on one of them."""
     case = load(path)
     none([line for here, there in (([], ["-s"]), (["-s"], [])) for line in differences(case, here, there)])

@@ -1,4 +1,4 @@
-"""The golden cases: what the compiler makes of a source, or of a command line; see golden.py."""
+"""The golden cases: the results of compiling a source, or of a command line; see golden.py."""
 
 import golden
 import pytest
@@ -17,5 +17,6 @@ def test_case(name):
 
 @pytest.mark.parametrize("name", CASES)
 def test_notation(name):
-    """The image that a case describes can be assembled in every order, and its reversal is the other one."""
+    """The image that a case describes can be assembled in every order, and reversing it gives the image of the other
+    order."""
     none(golden.check_notation(golden.Case(CASES[name])))

@@ -14,7 +14,7 @@ LITTLE, BIG = b"1tmf", b"fmt1"
 
 
 def found_in(root=None):
-    """For a project without a language, which does not search directories that are named after a machine."""
+    """For a project without a language, CMake does not search directories that are named after a machine."""
     place = only("lib*/**/cdgenConfig.cmake").parent
     return f"-Dcdgen_DIR={(root or tree()) / place.relative_to(tree())}"
 
@@ -24,7 +24,7 @@ def disk():
 
 
 class Trial(Case):
-    """A project made for the test; its classes add the generator."""
+    """A project made for the test. Its subclasses add the generator."""
 
     def project(self, text, **files):
         (self.here / "CMakeLists.txt").write_text(HEAD + text)
@@ -43,7 +43,7 @@ class Trial(Case):
 
 
 class Compile:
-    """What holds with every generator."""
+    """Tests that apply to every generator."""
 
     def test_class_without_name_is_called_after_the_bare_output(self):
         self.project("cdgen_compile(disk a.cdefsrc deep/er/Tape.cdef)", a=disk().read_bytes().replace(b"\tName=Disk\n", b""))
@@ -161,7 +161,7 @@ class Compile:
         self.assertIn(b"BlockSize", self.made("a.cdef"))
 
     def test_touched_source_is_compiled_once(self):
-        """The database keeps its inode, and the build system is content."""
+        """The database keeps its inode, and the build system then has nothing to do."""
         self.project_with_a_tree_of_its_own()
         self.build()
         before = (self.here / "b/a.cdef").stat()
@@ -186,7 +186,7 @@ class Compile:
             self.assertRaises(AssertionError, self.build)
 
     def test_no_output_without_the_map(self):
-        """What cdgen refuses at the end of a source, it refuses before there is an output."""
+        """An error that cdgen finds at the end of a source leaves no output."""
         self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=disk().read_bytes().split(b"ClassToManagerMapping")[0])
         with self.assertRaises(AssertionError) as failed:
             self.build()

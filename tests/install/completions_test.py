@@ -1,4 +1,4 @@
-"""Completions as a shell offers them, held against what the programs understand."""
+"""Compares the completions that a shell offers with the options and values that the programs accept."""
 
 import os
 import pty
@@ -27,7 +27,7 @@ class Shell(Case):
 
 
 class Offers:
-    """What holds in a shell that can be asked for all that it offers; offers() has it in the shell's order."""
+    """Tests for shells that can list all that they offer; offers() has it in the shell's order."""
 
     def offered(self, line):
         return set(self.offers(line))
@@ -110,7 +110,8 @@ class Fish(Offers, Shell):
 
 
 class Zsh(Shell):
-    """zsh completes at a terminal only: lines are typed, and a function in the program's place tells what came."""
+    """zsh completes only at a terminal: the test types lines, and a function in the place of the program prints its
+    arguments."""
 
     def completed(self, line):
         """The words after a tab."""

@@ -1,4 +1,4 @@
-"""The files for editors, in the editors themselves as far as they run without a screen."""
+"""Test the files for editors in the editors themselves, as far as these run without a screen."""
 
 import json
 import re
@@ -63,14 +63,14 @@ def compiles(place, source):
 
 
 def right_sources(place):
-    """Sources that compile: the examples, and the golden ones that do."""
+    """Sources that compile: the examples, and the golden cases that do."""
     golden = (PROJECT / "tests/golden").rglob("*.cdefsrc")
     found = {path.stem: path.read_bytes() for path in (*golden, *examples().rglob("*.cdefsrc"))}
     return {name: text.decode("latin-1") for name, text in found.items() if compiles(place, text)}
 
 
 def wrong_sources():
-    """Each with the mistake that is to be found in it: the line's number, and the kind."""
+    """Sources with the mistake that an editor must mark: the number of the line, and the kind."""
     before, header, after = RIGHT.partition("ClassToManagerMapping")
     at = before.count("\n") + 1
     return [(f"{before}{line}\n{header}{after}", (at, kind)) for line, kind in WRONG]
@@ -78,7 +78,7 @@ def wrong_sources():
 
 class Vim(Case):
     def ask(self, file, script):
-        """What the script appends to the list 'said', with the file open."""
+        """The items that the script appends to the list 'said' with the file open."""
         (self.here / "ask.vim").write_text(script)
         out = self.here / "said"
         run("vim", "-u", "NONE", "-N", "-i", "NONE", "-es",
@@ -89,7 +89,7 @@ class Vim(Case):
         return out.read_text().splitlines()
 
     def groups(self, source):
-        """Of each line: syntax groups, in the order in which they appear."""
+        """The syntax groups of each line, in the order in which they appear."""
         (self.here / "a.cdefsrc").write_text(source)
         said = self.ask("a.cdefsrc", """
             for line in range(1, line('$'))
@@ -211,7 +211,7 @@ class TextMate(Case):
                 for value in ([item] if key in ("match", "begin", "end") else self.expressions(item))]
 
     def matches(self, expression, text):
-        """jq has the regular expressions that editors use for grammars."""
+        """Uses jq, which has the same regular expressions as the editors that use grammars."""
         said = run("jq", "-n", "--arg", "re", expression, "--arg", "text", text, "$text | test($re)")
         return json.loads(said)
 
@@ -222,7 +222,7 @@ class TextMate(Case):
             self.matches(expression, "")
 
     def begun(self, lines):
-        """What of the grammar begins where a line does: of each line, the expressions."""
+        """For each line, the expressions of the grammar that match at its beginning."""
         used = sorted({text for text in self.expressions(self.grammar) if text.startswith("^")})
         (self.here / "asked.json").write_text(json.dumps([used, lines]))
         said = run("jq", "-c", ".[0] as $used | .[1] | map(. as $line | $used | map(. as $one | $line | test($one)))",
@@ -230,7 +230,7 @@ class TextMate(Case):
         return [{text for text, matches in zip(used, found) if matches} for found in json.loads(said)]
 
     def rule_at(self, patterns, begun):
-        """The first one that begins a line; included ones are looked up."""
+        """The first rule that matches at the beginning of a line; included rules are looked up."""
         for rule in patterns:
             rule = self.grammar["repository"][rule["include"][1:]] if "include" in rule else rule
             if rule.get("match", rule.get("begin")) in begun:

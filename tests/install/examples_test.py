@@ -31,7 +31,7 @@ class Project(Case):
         self.no_package()
 
     def no_half_of_a_database(self):
-        """What cannot be written does not cost the old database, and is tried again."""
+        """A failed build leaves the old database, and is tried again."""
         before = (self.project / "Disk.cdef").read_bytes()
         source = self.project / "Disk.cdefsrc"
         source.write_bytes(source.read_bytes().replace(b"4096", b"8192"))
@@ -43,7 +43,7 @@ class Project(Case):
             self.assertEqual((self.project / "Disk.cdef").read_bytes(), before)
 
     def every_mistake_is_shown(self, build, source):
-        """With its file and line."""
+        """Each with its file and line."""
         source.write_bytes(source.read_bytes().replace(b"UInt32", b"Uint32").replace(b"Id=1\n", b"Id=01\n"))
         later(source)
         with self.assertRaises(AssertionError) as failed:

@@ -1,5 +1,5 @@
-"""The Debian packages: what Debian's checker says, whose files they would overwrite, and installing, running and removing
-them in a root of their own."""
+"""Test the Debian packages: with Debian's checker, for conflicts with files of other packages, and by installing,
+running and removing them in a root of their own."""
 
 import os
 import pathlib
@@ -21,7 +21,7 @@ class Package(Case):
         cls.packages = {path.name.split("_")[0]: path for path in pathlib.Path(place.name).glob("*.deb")}
 
     def files(self, package):
-        """What a package installs, without its directories."""
+        """The files that a package installs."""
         listed = run("dpkg-deb", "--contents", self.packages[package]).splitlines()
         return {line.split(" ./", 1)[1].split(" -> ")[0] for line in listed if not line.startswith("d")}
 
@@ -37,7 +37,7 @@ class Package(Case):
         self.assertEqual(len(files), len(set(files)))
 
     def test_overwrite_no_file_of_other_packages(self):
-        """By the index of everything that Debian has, where it can be fetched."""
+        """According to the index of all Debian packages, if it can be fetched."""
         if not run("apt-file", "list", "--fixed-string", "base-files"):
             fetched = subprocess.run(["apt-file", "update"], capture_output=True, check=False)
             if fetched.returncode != 0 or not run("apt-file", "list", "--fixed-string", "base-files"):
@@ -71,7 +71,7 @@ class Package(Case):
         self.assertFalse(list((self.here / "usr").rglob("*")) if (self.here / "usr").exists() else [])
 
     def test_names_who_made_it(self):
-        """SECURITY.md sends reports there."""
+        """SECURITY.md tells users to report there."""
         maintainer = "A Packager <packager@packages.example>"
         run("cpack", "-G", "DEB", "-B", self.here, "-D", f"CPACK_PACKAGE_CONTACT={maintainer}", cwd=BUILD)
         (package,) = self.here.glob("cdgen_*.deb")
@@ -103,7 +103,7 @@ class Reproducible(Case):
             self.assertTrue(here == there, pattern)
 
     def made(self, build, generator, pattern):
-        """The bytes of the packages by name, without what the environment says of the time."""
+        """The bytes of the packages by name, built without an environment variable for the time."""
         environment = {name: value for name, value in os.environ.items() if name != "SOURCE_DATE_EPOCH"}
         with tempfile.TemporaryDirectory(dir=self.here) as place:
             run("cpack", "-G", generator, "-B", place, cwd=build, env=environment)

@@ -1,4 +1,4 @@
-"""The manual pages as a reader gets them."""
+"""Test the manual pages as a reader sees them."""
 
 import itertools
 import os
@@ -34,7 +34,7 @@ class Pages(unittest.TestCase):
 
 
 class Copied(Case):
-    """Who copies the class from the page, as a terminal shows it, has a source."""
+    """A class that is copied from the page as a terminal shows it is a valid source."""
 
     def compile(self, shown):
         chapter = re.search(r"^A WHOLE CLASS\n(.*?)^LINES$", shown, re.M | re.S).group(1)
@@ -52,7 +52,7 @@ class Copied(Case):
 
 
 class Options(unittest.TestCase):
-    """The handwritten pages have what the programs understand."""
+    """The handwritten pages list the options that the programs accept."""
 
     def page(self, name):
         return (tree() / f"share/man/man1/{name}.1").read_text()

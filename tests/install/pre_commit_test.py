@@ -1,4 +1,4 @@
-"""The hooks for pre-commit, with Debian's pre-commit and the installed programs."""
+"""Test the hooks with Debian's pre-commit and the installed programs."""
 
 import os
 import subprocess
@@ -35,7 +35,7 @@ class Hooks(Case):
         self.git(place, "commit", "-qm", "a commit")
 
     def run_hooks(self):
-        """The status, and what the hooks say of a staged change."""
+        """The status and the output of the hooks for a staged change."""
         self.git(self.project, "add", "-A")
         done = subprocess.run(["pre-commit", "run", "--color=never"], cwd=self.project, env=self.environment, text=True,
                               stdout=subprocess.PIPE, stderr=subprocess.STDOUT, check=False)

@@ -1,4 +1,4 @@
-"""The installed schemas, which the documents that the installed program writes name and follow."""
+"""Test that the documents of the installed program name the installed schemas and follow them."""
 
 import json
 import subprocess
@@ -10,7 +10,7 @@ from installed import Case, examples, program, tree
 
 class Schemas(Case):
     def document(self, *arguments):
-        """What a subcommand writes as JSON; it follows the installed schema that it names."""
+        """A subcommand's JSON document, checked against the installed schema that it names."""
         done = subprocess.run([program("cdef"), *arguments, "--format", "json"], cwd=self.here, capture_output=True,
                               timeout=60)
         data = json.loads(done.stdout)

@@ -1,4 +1,4 @@
-"""What is installed, and where."""
+"""Test which files are installed, and where."""
 
 import ctypes
 import os
@@ -100,7 +100,7 @@ extern "C" int is_sound(const char *name) {
 
 class Shared(Case):
     def test_library_can_be_part_of_a_shared_one(self):
-        """A plug-in, say of an interpreter, is one."""
+        """Such as a plug-in for an interpreter."""
         (self.here / "plugin.cpp").write_text(PLUGIN)
         flags = shlex.split(run("pkg-config", "--cflags", "--libs", "cdgen", env=pkg_config_environment()))
         run("c++", "-std=c++20", "-fPIC", "-shared", "-Wl,--no-undefined", "plugin.cpp", "-o", "plugin.so", *flags,

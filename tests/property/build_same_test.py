@@ -18,14 +18,14 @@ LITTLE = b"1tmf"
 
 
 def native_order(directory):
-    """What cdgen writes without -s."""
+    """The option for the byte order that cdgen writes without -s."""
     (directory / "probe.cdefsrc").write_bytes((EXAMPLES / "Process.cdefsrc").read_bytes())
     subprocess.run([PROGRAMS.cdgen, "probe.cdefsrc", "probe.cdef"], cwd=directory, check=True)
     return "little" if (directory / "probe.cdef").read_bytes()[8:12] == LITTLE else "big"
 
 
 def built(paths, order, place):
-    """What cdef build says about each source; the databases are in "out" in a directory."""
+    """The findings of cdef build for each source. The databases are in "out" in a directory."""
     command = [PROGRAMS.cdef, "build", "-d", "out", "-j2", f"--byte-order={order}", "--format=json", *paths]
     result = subprocess.run(command, cwd=place, capture_output=True, timeout=600, env=environment())
     if result.returncode not in (0, 1) or result.stderr:
@@ -40,7 +40,7 @@ def by_source(document):
 
 
 def differences(paths, swap, native, directory):
-    """The differences for some sources, and how many of them compile."""
+    """The differences for some sources, and the number of sources that compile."""
     places = [directory / name for name in ("cdgen", "cdef")]
     for place in places:
         (place / "out").mkdir(parents=True, exist_ok=True)
@@ -66,7 +66,7 @@ def differences(paths, swap, native, directory):
 @pytest.mark.slow(9)
 @pytest.mark.parametrize("group", range(GROUPS))
 def test_same_databases(group, directory):
-    """Half the sources of a group if their number is given, as script/proof does; otherwise, an eighth."""
+    """Half the sources of a group if --cases is given, as by script/proof; otherwise an eighth."""
     every = 2 if PROGRAMS.cases else 8
     golden = sorted((TESTS / "golden").glob("**/*.cdefsrc"))
     seeds = [path.read_bytes().decode("utf-8", "replace") for path in golden + sorted(EXAMPLES.glob("*.cdefsrc"))]

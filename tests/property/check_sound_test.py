@@ -54,7 +54,7 @@ def stanzas_of(lines):
 
 
 def change_lines(rng, lines, pool):
-    """One change of a line or of a stanza."""
+    """Makes one change of a line or of a stanza."""
     at = rng.randrange(len(lines)) if lines else 0
     kind = rng.randrange(12)
     if kind == 0 and lines:
@@ -108,7 +108,7 @@ def generated(seeds, count, seed):
 
 
 def mutated(count, seed):
-    """Sources that are right, each with mutations."""
+    """Correct sources, each with its mutations."""
     for number in range(seed * COUNT, seed * COUNT + -(-count // (1 + MUTATIONS))):
         text, _ = generate_sources.source(number)
         yield text
@@ -117,12 +117,13 @@ def mutated(count, seed):
 
 
 def plain(text):
-    """A message, however many bytes that are no text each replacement stands for."""
+    """A message in which each run of replacement characters is one, because programs replace invalid bytes differently.
+    """
     return re.sub("\ufffd+", "\ufffd", text.replace("\t", " "))
 
 
 def compiled(program, paths, directory, outputs=None, options=()):
-    """What cdgen says about each source, by its driver: None when it compiles it."""
+    """What cdgen, run by its driver, reports about each source; None if the source compiles."""
     outputs = outputs or ["out.cdef"] * len(paths)
     jobs = "".join("\t".join([*options, str(path), out]) + "\n" for path, out in zip(paths, outputs))
     result = subprocess.run([program], input=os.fsencode(jobs), cwd=directory, stdout=subprocess.PIPE, check=True,
@@ -135,7 +136,7 @@ def compiled(program, paths, directory, outputs=None, options=()):
 
 
 def same(expected, errors):
-    """Whether the errors begin with what cdgen said."""
+    """Whether the errors begin with the one that cdgen reports."""
     if expected is None or not errors:
         return expected is None and not errors
     message = plain(errors[0]["message"])
@@ -159,12 +160,12 @@ def differences(paths, directory):
 
 
 def count():
-    """How many sources all groups make together; a sanitizer gets fewer."""
+    """The number of sources in all groups; smaller under a sanitizer."""
     return PROGRAMS.cases or (SANITIZED_COUNT if PROGRAMS.sanitizers else COUNT)
 
 
 def made(seeds, group):
-    """The sources of a group in this round, half of either kind."""
+    """The sources of a group in this round, half of each kind."""
     share = count() // GROUPS
     number = PROGRAMS.round * GROUPS + group
     for text in generated(seeds, share // 2, number):
@@ -191,7 +192,7 @@ def test_same_errors(group, directory):
 
 
 def keep(problems):
-    """Copies the sources that differ to where they are wanted."""
+    """Copies the sources that differ to the directory of --keep."""
     for problem in problems if PROGRAMS.keep else ():
         source = pathlib.Path(problem.split(":")[0])
         (PROGRAMS.keep / source.name).write_bytes(source.read_bytes())

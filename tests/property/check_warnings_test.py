@@ -1,4 +1,4 @@
-"""Hold the warnings of "cdef check" against a second opinion on generated sources.
+"""Compare the warnings of "cdef check" on generated sources with those of a second implementation.
 
 The opinion is told here once more, in the simplest words and without regard to
 speed: every pair of values, every pair of names.  A warning that is missing and
@@ -53,7 +53,7 @@ class Stanza:
 
 
 def stanzas_of(source):
-    """The stanzas of a source that is right."""
+    """The stanzas of a correct source."""
     stanzas = []
     for number, line in enumerate(source.decode("latin-1").split("\n"), 1):
         text = line
@@ -82,7 +82,7 @@ def integer(text):
 
 
 def key(data_type, text):
-    """What can be compared of a value, or None."""
+    """The part of a value that can be compared, or None."""
     element = data_type.removesuffix("Array")
     if element in BITS:
         number = int(text) % 2 ** BITS[element]
@@ -98,20 +98,20 @@ def key(data_type, text):
 
 
 def own_default(data_type):
-    """The default that a type has by itself."""
+    """The default of a type."""
     element = data_type.removesuffix("Array")
     return 0 if element in (*BITS, "Float32", "Float64") else b""
 
 
 def ranges(data_type, lines):
-    """Line and bounds of ranges of values; a bound may be None."""
+    """The lines and bounds of ranges of values; a bound may be None."""
     for line, value in lines:
         low, comma, high = value.partition(",")
         yield line, key(data_type, low), key(data_type, high if comma else low)
 
 
 def is_allowed(value, data_type, lines):
-    """Whether some line allows a value; yes also if that cannot be known."""
+    """Whether some line allows a value; also true if that cannot be known."""
     allowed = list(ranges(data_type, lines))
     strange = any(low is None or high is None or low > high for _, low, high in allowed)
     commas = data_type.startswith("String") and any(text.count(",") > 1 for _, text in lines)
@@ -156,7 +156,7 @@ def overlaps(stanzas):
 
 
 def scopes(stanzas):
-    """Line, stanza kind, name and scope of each name; the kinds of a scope have their names together."""
+    """Line, stanza kind, name and scope of each name. The names of the kinds in a scope must differ."""
     run, before = 0, None
     for stanza in stanzas:
         run += stanza.kind != before
@@ -237,7 +237,7 @@ def groups(stanzas):
 
 
 def is_balanced(text):
-    """Whether parentheses and quotes come in pairs."""
+    """Whether all parentheses and quotes come in pairs."""
     depth, quote, escaped = 0, "", False
     for letter in text:
         if escaped or letter == "\\":
@@ -283,7 +283,7 @@ CODES = {"S502", "S504", "S505", "S506", "S507", "S518", "S528", "S529", "S530",
 
 
 def differences(paths):
-    """What differs for some sources."""
+    """The differences for some sources."""
     result = subprocess.run([PROGRAMS.cdef, "check", "--format", "json", *paths], capture_output=True, timeout=600)
     if result.returncode != 0 or result.stderr:
         return [f"status {result.returncode}: {result.stderr!r} for {paths}"]

@@ -37,7 +37,7 @@ HEADER = re.compile(r"^[A-Z][A-Za-z]+$")
 
 
 def misspelled(rng, name):
-    """One letter added, dropped, replaced or swapped with its neighbour."""
+    """A word with one letter added, dropped, replaced or swapped with its neighbour."""
     at = rng.randrange(len(name))
     letter = rng.choice("abcdefghijklmnopqrstuvwxyz")
     return rng.choice((
@@ -49,13 +49,13 @@ def misspelled(rng, name):
 
 
 def with_misspelling(rng, lines):
-    """The name of a stanza or of an attribute."""
+    """Misspells the name of a stanza or of an attribute."""
     at = rng.choice([at for at, line in enumerate(lines) if NAME.match(line)])
     lines[at] = NAME.sub(lambda m: m[1] + misspelled(rng, m[2]) + m[3], lines[at])
 
 
 def with_misspelled_value(rng, lines):
-    """A data type or a property."""
+    """Misspells a data type or a property."""
     places = [at for at, line in enumerate(lines) if re.match(r"^[ \t]+(DataType|Properties|VariableType)=\w+$", line)]
     at = rng.choice(places)
     name, value = lines[at].split("=")
@@ -63,25 +63,25 @@ def with_misspelled_value(rng, lines):
 
 
 def with_blank(rng, lines):
-    """A blank in front of an equals sign."""
+    """Puts a blank in front of an equals sign."""
     at = rng.choice([at for at, line in enumerate(lines) if re.match(r"^[ \t]+\w+=", line)])
     lines[at] = lines[at].replace("=", rng.choice((" =", "\t=", "  =")), 1)
 
 
 def with_indented_header(rng, lines):
-    """A blank in front of a header."""
+    """Puts a blank in front of a header."""
     at = rng.choice([at for at, line in enumerate(lines) if HEADER.match(line)])
     lines[at] = rng.choice((" ", "\t", "  ")) + lines[at]
 
 
 def with_outdented_attribute(rng, lines):
-    """An attribute in column 1. Its tab comes back, so it had one."""
+    """Moves an attribute to column 1. The correction inserts a tab, so the line must have had one."""
     at = rng.choice([at for at, line in enumerate(lines) if re.match(r"^\t\w+=", line)])
     lines[at] = lines[at][1:]
 
 
 def with_early_optional(rng, lines):
-    """The optional attribute after the last required one, somewhere before that."""
+    """Moves the optional attribute after the last required one to an earlier place."""
     places = []
     for at, line in enumerate(lines):
         missing = set(REQUIRED.get(line, "").split())
@@ -117,26 +117,26 @@ def planted(rng, text):
 
 
 def run(*arguments):
-    """What `cdef check` does with sources."""
+    """Runs `cdef check` on sources."""
     result = subprocess.run([PROGRAMS.cdef, "check", *arguments], capture_output=True, timeout=600, check=False)
     assert result.returncode in (0, 1), result.stderr[-1000:]
     return result
 
 
 def errors_in(paths):
-    """How many errors each source has."""
+    """The number of errors in each source."""
     return [each["errors"] for each in json.loads(run("--json", *paths).stdout)["sources"]]
 
 
 def fixed(paths):
-    """Corrects them, and returns what they are then."""
+    """Corrects the sources and returns the results."""
     run("--fix", *paths)
     return [path.read_bytes() for path in paths]
 
 
 @pytest.fixture(name="sound", params=range(GROUPS))
 def sound_sources(request, directory):
-    """Sound sources that nothing is corrected in, each in a file, and a source of chance."""
+    """Correct sources in which nothing is corrected, each in a file, and a random generator."""
     share = (PROGRAMS.cases or (SANITIZED_COUNT if PROGRAMS.sanitizers else COUNT)) // GROUPS
     number = PROGRAMS.round * GROUPS + request.param
     paths = []
@@ -151,7 +151,7 @@ def sound_sources(request, directory):
 
 @pytest.mark.slow(5)
 def test_one_mistake(sound):
-    """The sound source comes back."""
+    """The correction restores the sound source."""
     sources, rng = sound
     wrong, ambiguous = [], 0
     for path, text in sources:
@@ -174,7 +174,7 @@ def test_one_mistake(sound):
 
 @pytest.mark.slow(5)
 def test_many_mistakes(sound):
-    """Never more errors, and nothing left to correct."""
+    """A correction never adds errors, and a second one changes nothing."""
     sources, rng = sound
     for path, text in sources:
         source = text.decode("latin-1")

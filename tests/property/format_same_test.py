@@ -1,4 +1,5 @@
-"""Format many sources: each compiles to the same database, keeps its comments, and is not changed again.
+"""Format many sources: each compiles to the same database, keeps its comments, and does not change when formatted
+again.
 
 The sources are the golden cases, the examples, and those of generate_sources.py, which are written untidily first.
 """
@@ -21,7 +22,7 @@ SANITIZED_COUNT = 400
 
 
 class Batch:
-    """Some sources by name, in a directory for each form."""
+    """Some sources by name, in one directory for each form."""
 
     def __init__(self, directory, sources):
         self.directory = directory
@@ -29,17 +30,17 @@ class Batch:
         self.write("given", sources)
 
     def write(self, form, sources):
-        """One form of the sources."""
+        """Writes one form of the sources."""
         (self.directory / form).mkdir(parents=True)
         for name, text in sources.items():
             (self.directory / form / f"{name}.cdefsrc").write_bytes(text)
 
     def read(self, form):
-        """That form."""
+        """Reads that form."""
         return {name: (self.directory / form / f"{name}.cdefsrc").read_bytes() for name in self.names}
 
     def databases(self, form):
-        """What each source compiles to; None if it does not."""
+        """The database of each source; None if it does not compile."""
         place = self.directory / form
         paths = [f"{name}.cdefsrc" for name in self.names]
         outputs = [f"{name}.cdef" for name in self.names]
@@ -48,7 +49,7 @@ class Batch:
                 for name, output, text in zip(self.names, outputs, said)}
 
     def format(self, form, *options):
-        """Run cdef format on all of them; the names that standard output has, and the status."""
+        """Runs cdef format on all sources. Returns the names on standard output, and the status."""
         paths = [f"{name}.cdefsrc" for name in self.names]
         result = subprocess.run([PROGRAMS.cdef, "format", *options, *paths], cwd=self.directory / form,
                                 capture_output=True, timeout=600, check=False, env=environment())
@@ -56,12 +57,12 @@ class Batch:
 
 
 def longest(text):
-    """The lines that are read in pieces."""
+    """The lines that the compiler reads in pieces."""
     return [line for line in text.split(b"\n") if len(line) > LINE]
 
 
 def differences(batch, form, *options):
-    """Format the given sources, in a directory of that name; what is wrong with the results."""
+    """Formats the sources in a directory, and returns what is wrong with the results."""
     given, before = batch.read("given"), batch.databases("given")
     batch.write(form, given)
     listed, status = batch.format(form, "-i", *options)
@@ -94,7 +95,7 @@ def generated(group):
 @pytest.mark.slow(3)
 @pytest.mark.parametrize("group", range(GROUPS))
 def test_generated(group, directory):
-    """Sources that compile, untidily written."""
+    """Untidy sources that compile."""
     problems, sources = [], list(generated(group))
     for start in range(0, len(sources), BATCH):
         some = sources[start:start + BATCH]
@@ -108,7 +109,7 @@ def test_generated(group, directory):
 
 
 def test_golden(directory):
-    """All golden cases and examples; of those that do not compile, no byte changes."""
+    """All golden cases and examples. Those that do not compile are not changed."""
     paths = [*sorted((TESTS / "golden").glob("**/*.cdefsrc")), *sorted(EXAMPLES.glob("**/*.cdefsrc"))]
     sources = {f"{number}-{path.stem}": path.read_bytes() for number, path in enumerate(paths)}
     batch = Batch(directory, sources)

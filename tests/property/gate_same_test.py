@@ -41,7 +41,7 @@ def is_header(line):
 
 
 def without_stanza(chooser, lines):
-    """Without one attribute or action, and what follows it up to the next header."""
+    """The source without one attribute or action, and without the lines up to the next header."""
     places = [at for at, line in enumerate(lines) if line in HEADERS]
     if not places:
         return lines
@@ -51,7 +51,7 @@ def without_stanza(chooser, lines):
 
 
 def with_other_value(chooser, lines):
-    """With another value of one attribute, or without it."""
+    """The source with another value of one attribute, or without that line."""
     places = [at for at, line in enumerate(lines) if line.strip().partition(b"=")[0] in VALUES]
     if not places:
         return lines
@@ -63,7 +63,7 @@ def with_other_value(chooser, lines):
 
 
 def with_new_stanza(chooser, lines):
-    """With a new attribute at the end."""
+    """The source with a new attribute at the end."""
     kind = chooser.choice(HEADERS[:2])
     number = chooser.choice([b"0", b"3", b"900"])
     return lines + [kind, b"\tName=Added", b"\tDescription=1", b"\tDisplayName=2", b"\tId=" + number, b"\tDataType=Int32",
@@ -80,7 +80,7 @@ def changed(chooser, text):
 
 
 def run(*command, place):
-    """Standard output of a run that may find something."""
+    """The standard output of a run that may have findings."""
     result = subprocess.run([PROGRAMS.cdef, *command], cwd=place, capture_output=True, timeout=600, env=environment())
     if result.returncode not in (0, 1):
         raise RuntimeError(f"{command[0]}: status {result.returncode}: {result.stderr!r}")
@@ -88,13 +88,13 @@ def run(*command, place):
 
 
 def as_line(finding):
-    """A finding as cdef diff shows it: the further reasons are in notes, before their codes."""
+    """A finding in the form of cdef diff: further reasons are in notes, followed by their codes."""
     more = "".join("; " + note["message"].rpartition(" [")[0] for note in finding["notes"])
     return finding["message"][:-1] + more + ")"
 
 
 def differences(names, level, place):
-    """Where the two disagree about some pairs."""
+    """The pairs about which the two subcommands disagree."""
     document = json.loads(run("gate", "--format=json", f"--level={level}", "--against=old", *names, place=place))
     problems = []
     for name, source in zip(names, document["sources"]):
@@ -107,7 +107,7 @@ def differences(names, level, place):
 
 
 def pairs(place, count, seed):
-    """The names of so many pairs at most: NAME.cdefsrc, old/NAME.cdef and new/NAME.cdef."""
+    """The names of at most so many pairs: NAME.cdefsrc, old/NAME.cdef and new/NAME.cdef."""
     chooser = random.Random(seed)
     texts = []
     for number in range(count * TRIES):
@@ -131,7 +131,7 @@ def pairs(place, count, seed):
 @pytest.mark.slow(6)
 @pytest.mark.parametrize("group", range(GROUPS))
 def test_finds_what_diff_finds(group, directory):
-    """At each level in turn; and nothing against itself."""
+    """At each level in turn. A source compared with itself has no findings."""
     count = (PROGRAMS.cases or COUNT) // GROUPS
     names = pairs(directory, count, PROGRAMS.round * GROUPS + group)
     assert len(names) >= count // 2, f"{len(names)} pairs compile"

@@ -23,13 +23,13 @@ ENDS = ("\r\n", "\r")
 
 
 def numbers(group):
-    """Those of a group's sources."""
+    """The numbers of a group's sources."""
     count = PROGRAMS.cases or (SANITIZED_COUNT if PROGRAMS.sanitizers else COUNT)
     return range(PROGRAMS.round * count + group, (PROGRAMS.round + 1) * count, GROUPS)
 
 
 def source(seed):
-    """A text with letters and ends of lines that are not in the generated ones."""
+    """A generated text with letters of other scripts and other ends of lines."""
     chooser = random.Random(seed)
     text = generate_sources.source(seed)[0]
     if seed % 2:
@@ -42,7 +42,7 @@ def source(seed):
 
 
 def characters(text, found):
-    """The characters of the text that a finding of cdef check is about: begin and end."""
+    """The begin and end, in characters of the text, of a finding of cdef check."""
     raw, line = text.encode(), found.get("physical_line") or found["line"] or 0
     if line == 0:
         return 0, 0
@@ -60,12 +60,12 @@ def characters(text, found):
 
 
 def within_end(text, at):
-    """A place between a carriage return and its newline is before both."""
+    """If a place is between a carriage return and its newline, the place before both; otherwise the place itself."""
     return at - 1 if text[at - 1:at + 1] == "\r\n" else at
 
 
 def expected(text, found, encoding):
-    """The diagnostic that a finding has to be."""
+    """The diagnostic that corresponds to a finding."""
     start, end = (position(text, within_end(text, at), encoding) for at in characters(text, found))
     return {"range": {"start": start, "end": end}, "severity": 1 if found["severity"] == "error" else 2,
             "code": found["code"], "source": "cdef", "message": found["message"], "data": {"name": found["name"]}}
@@ -83,7 +83,7 @@ def checked(directory, texts):
 
 
 def shown(client, uri, version):
-    """Diagnostics without what refers to notes."""
+    """Diagnostics without the members that refer to notes."""
     return [{key: value for key, value in each.items() if key != "relatedInformation"}
             for each in client.diagnostics(uri, version)]
 
@@ -91,7 +91,7 @@ def shown(client, uri, version):
 @pytest.mark.slow(20)
 @pytest.mark.parametrize("group", range(GROUPS))
 def test_findings_are_those_of_check(directory, group):
-    """The same findings in the same order, with notes as related places."""
+    """The same findings in the same order. Notes are related places."""
     encoding = ("utf-16", "utf-8")[group % 2]
     texts, wrong = {seed: source(seed) for seed in numbers(group)}, []
     with Client(capabilities={**CAPABILITIES, "general": {"positionEncodings": [encoding]}}) as client:
@@ -109,7 +109,7 @@ def test_findings_are_those_of_check(directory, group):
 
 
 def edit(chooser, text, encoding):
-    """A change, and the text that it makes. A carriage return and its newline are not parted."""
+    """A change, and the text that results from it. It never separates a carriage return from its newline."""
     begin, end = sorted(within_end(text, chooser.randrange(len(text) + 1)) for _ in range(2))
     end = within_end(text, min(end, begin + chooser.randrange(40)))
     end = max(begin, end)
@@ -121,7 +121,7 @@ def edit(chooser, text, encoding):
 @pytest.mark.slow(20)
 @pytest.mark.parametrize("group", range(GROUPS))
 def test_edits_end_in_the_state_of_a_fresh_open(group):
-    """What is shown after many changes is what is shown of the text that they make."""
+    """After many changes, the findings are those of the resulting text."""
     encoding, wrong = ("utf-16", "utf-8")[group % 2], []
     sequences = [seed for count, seed in enumerate(numbers(group)) if count % 5 < 2]
     with Client(capabilities={**CAPABILITIES, "general": {"positionEncodings": [encoding]}}) as client:

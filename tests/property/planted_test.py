@@ -29,7 +29,7 @@ FOLLOWING = 0.01
 
 
 def sound_source(number):
-    """A source that is right: every fourth is one of the examples."""
+    """A correct source; one in four is an example."""
     examples = sorted(EXAMPLES.glob("*.cdefsrc"))
     if number % 4 == 0:
         return examples[number // 4 % len(examples)].read_text()
@@ -37,7 +37,7 @@ def sound_source(number):
 
 
 def planted(count, first):
-    """So many mistakes, kind after kind: (kind, sound source, source with the mistake, lines)."""
+    """So many mistakes, their kinds in turn: (kind, sound source, source with the mistake, lines)."""
     number = first * 1000003
     for at in range(count):
         kind = plant_mistakes.KINDS[at % len(plant_mistakes.KINDS)]
@@ -50,7 +50,7 @@ def planted(count, first):
 
 
 def findings(sources, directory):
-    """What is found in each of the sources."""
+    """The findings for each of the sources."""
     paths = [directory / f"{number}.cdefsrc" for number in range(len(sources))]
     for path, source in zip(paths, sources):
         path.write_bytes(source.encode("latin-1"))
@@ -59,7 +59,7 @@ def findings(sources, directory):
 
 
 def added(before, after):
-    """The findings that a source did not have before; lines may have been moved."""
+    """The findings that are new compared with the sound source; lines may have moved."""
 
     def known(finding):
         return finding["code"], finding["message"], finding["source"]
@@ -75,7 +75,8 @@ def added(before, after):
 
 
 def measured(group, count, directory):
-    """Of each mistake of a group: its kind, its source, the lines, what was found, and the number of errors that follow."""
+    """For each mistake of a group: its kind, its source, the lines, the findings, and the number of errors that follow
+    from it."""
     mistakes = list(planted(count, PROGRAMS.round * GROUPS + group))
     for start in range(0, len(mistakes), BATCH):
         batch = mistakes[start:start + BATCH]
@@ -91,7 +92,7 @@ def measured(group, count, directory):
 @pytest.mark.slow(20)
 @pytest.mark.parametrize("group", range(GROUPS))
 def test_planted(group, directory):
-    """At least 99 of 100 mistakes are found, with fewer than one error in 100 that follows."""
+    """At least 99 of 100 mistakes are found, with fewer than one consequential error in 100."""
     count = max(PROGRAMS.cases or (LEAST if PROGRAMS.sanitizers else COUNT), LEAST) // GROUPS
     lost, following = collections.Counter(), collections.Counter()
     for number, (kind, source, lines, new, found, errors) in enumerate(measured(group, count, directory)):

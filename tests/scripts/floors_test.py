@@ -33,7 +33,7 @@ def library(directory, folder, **sources):
     return made
 
 
-def test_house_stands():
+def test_floors_are_as_they_should_be():
     if PROGRAMS.sanitizers:
         pytest.skip("everything needs the sanitizer's library there")
     run = subprocess.run([sys.executable, "-B", SCRIPT, PROGRAMS.build], capture_output=True, text=True, check=False)

@@ -20,7 +20,7 @@ TIME = slice(16, 24)
 
 
 def build(world, *arguments, **more):
-    """A run of cdef build, without what the environment says about times."""
+    """Runs cdef build without the environment variables that set the time."""
     environment = {**os.environ, "LC_ALL": "C", **more.pop("env", {})}
     for name in ("VX_CDB_FORCE_EMPTY_TIMESTAMP", "SOURCE_DATE_EPOCH"):
         if name not in more.get("keep", ()):
@@ -30,12 +30,12 @@ def build(world, *arguments, **more):
 
 
 def made(world, *arguments, **more):
-    """A run that says nothing and makes what is asked for."""
+    """Runs cdef build, which must succeed and print nothing."""
     expect(build(world, *arguments, **more), 0)
 
 
 def of_its_own(number, text=HEAD):
-    """A class with a name and a message catalog that no other number has."""
+    """A class with a name and a message catalog of its own."""
     return text.replace(b"Name=Disk", b"Name=Disk%d" % number).replace(b"mgr1.cat", b"mgr%d.cat" % number)
 
 
@@ -56,7 +56,7 @@ def files(world, place="."):
 
 
 def test_makes_what_cdgen_makes(world):
-    """Byte for byte, with the class called after the output as given."""
+    """The same bytes. A class without a Name is named after the output as given."""
     for text in (HEAD + attributes(30), NAMELESS):
         good = world.good(text)
         for out in (OUT, "./d.cdef/x", "d.cdef/x.cdef"):
@@ -71,7 +71,7 @@ def test_makes_what_cdgen_makes(world):
 
 
 def test_makes_each_byte_order(world):
-    """What cdgen -s makes on this machine is the other one."""
+    """One of the two is what cdgen -s writes on this machine."""
     native, other = world.good(HEAD + attributes(3)), world.good(None, "-s")
     little, big = (native, other) if native[8:12] == b"1tmf" else (other, native)
     for order, expected in (("native", native), ("little", little), ("big", big)):
@@ -82,7 +82,7 @@ def test_makes_each_byte_order(world):
 
 
 def test_calls_a_class_of_both_byte_orders_after_the_name_without_them(world):
-    """So that both are the same class."""
+    """So both databases contain the same class."""
     world.write(SOURCE, NAMELESS)
     made(world, "--no-warn=no-name", "--byte-order=both", "-o", "Disk.cdef", SOURCE)
     for name in ("Disk.le.cdef", "Disk.be.cdef"):
@@ -90,7 +90,7 @@ def test_calls_a_class_of_both_byte_orders_after_the_name_without_them(world):
 
 
 def test_puts_databases_beside_their_sources(world):
-    """Without -o and -d."""
+    """This is the default, without -o and -d."""
     sources(world, "d/a.cdefsrc", "b.txt")
     result = build(world, "d/a.cdefsrc", "b.txt")
     expect(result, 0, b"cdef: 2 databases: 2 written, 0 unchanged, 0 not made\n")
@@ -98,7 +98,7 @@ def test_puts_databases_beside_their_sources(world):
 
 
 def test_takes_directories_for_the_sources_below_them(world):
-    """In the order of their names; hidden files and directories are left out. The output directory is made."""
+    """In the order of their names, without hidden files and directories. The output directory is created."""
     sources(world, "in/b.cdefsrc", "in/d/a.cdefsrc", "in/.hidden/c.cdefsrc", "in/.d.cdefsrc", "in/e.txt")
     expect(build(world, "--list", "-d", "out/more", "in"), 0, stdout=b"out/more/b.cdef\nout/more/a.cdef\n")
     expect(build(world, "-d", "out/more", "in"), 0, b"cdef: 2 databases: 2 written, 0 unchanged, 0 not made\n")
@@ -113,7 +113,7 @@ def test_lists_databases_and_makes_none(world):
 
 
 def test_reads_standard_input_and_writes_standard_output(world):
-    """Either or both."""
+    """Each alone, and both together."""
     good = world.good()
     with open(world.path(SOURCE), "rb") as source:
         made(world, "-o", OUT, "-", stdin=source)
@@ -125,7 +125,7 @@ def test_reads_standard_input_and_writes_standard_output(world):
 
 
 def test_leaves_the_same_database_alone(world):
-    """To the inode and the time, whatever the time in it."""
+    """It keeps its inode and its modification time, whatever time it contains."""
     for first, second in ((("--timestamp=none",), ("--timestamp=now",)), (("--timestamp=7",), ()), ((), ())):
         made(world, *first, "-o", OUT, SOURCE)
         os.utime(world.path(OUT), (5, 5))
@@ -135,7 +135,7 @@ def test_leaves_the_same_database_alone(world):
 
 
 def test_replaces_another_database(world):
-    """A new file; programs that have the old one open keep it."""
+    """By a new file: programs that have the old file open keep it."""
     made(world, "-o", OUT, SOURCE)
     old = open(world.path(OUT), "rb")
     world.write(SOURCE, HEAD + attributes(1))
@@ -144,7 +144,7 @@ def test_replaces_another_database(world):
 
 
 def test_mends_a_damaged_database(world):
-    """Also one that has the right size, and one that only its checksum damages."""
+    """Even if the size is right, or only the checksum shows the damage."""
     made(world, "-o", OUT, SOURCE)
     good = world.read()
     for place in (4, 100, len(good) - 1):
@@ -154,7 +154,7 @@ def test_mends_a_damaged_database(world):
 
 
 def test_keeps_the_mode_and_follows_links(world):
-    """The link stays one."""
+    """The link is not replaced."""
     world.write("target", BEFORE)
     os.chmod(world.path("target"), 0o640)
     world.path(OUT).symlink_to("target")
@@ -164,7 +164,7 @@ def test_keeps_the_mode_and_follows_links(world):
 
 
 def test_leaves_the_database_of_a_wrong_source(world):
-    """And that of an odd one, if warnings count; that of another source is made."""
+    """Also that of a source with warnings, if warnings count as errors. The database of another source is made."""
     sources(world, "a.cdefsrc", text=WRONG)
     sources(world, "b.cdefsrc", text=ODD)
     sources(world, "c.cdefsrc")
@@ -182,14 +182,14 @@ def test_leaves_the_database_of_a_wrong_source(world):
 @pytest.mark.parametrize("options", [(), ("--werror",), ("--no-warn=octal",), ("--format=json",), ("--format=sarif",)])
 @pytest.mark.parametrize("text", [WRONG, ODD, HEAD])
 def test_says_what_check_says(world, options, text):
-    """The same findings in the same form, and the same status."""
+    """The findings, their form and the exit status are those of cdef check."""
     world.write(SOURCE, text)
     checked = world.inspect("check", *options, SOURCE)
     expect(build(world, *options, SOURCE), checked.returncode, checked.stderr, checked.stdout)
 
 
 def test_says_the_same_however_many_at_once(world):
-    """In the order of the sources."""
+    """The findings are in the order of the sources."""
     names = [f"{number:02}.cdefsrc" for number in range(40)]
     for number, name in enumerate(names):
         world.write(name, of_its_own(number // 2, (HEAD + attributes(60), WRONG, ODD)[number % 3]))
@@ -201,7 +201,7 @@ def test_says_the_same_however_many_at_once(world):
 
 
 def test_warns_of_a_class_that_is_called_after_the_database(world):
-    """Not of one with a Name; cdef check, which knows of no database, warns of neither."""
+    """But not of a class with a Name. cdef check does not know the database and does not warn of either."""
     world.write(SOURCE, NAMELESS)
     warning = (b"class.cdefsrc:3:1: warning: the class has no `Name`: it is called `d/x`, after the database [S601 no-name]\n"
                b"    3 | ResourceClass\n"
@@ -215,7 +215,7 @@ def test_warns_of_a_class_that_is_called_after_the_database(world):
 
 
 def test_writes_no_nameless_class_to_standard_output(world):
-    """It has no name after which a class could be called."""
+    """Standard output has no name after which the class could be called."""
     world.write(SOURCE, NAMELESS)
     result = build(world, "-o", "-", SOURCE)
     check(result.returncode == 1 and result.stdout == b"", result)
@@ -236,7 +236,7 @@ def all_of(terminal):
 
 
 def test_warns_of_classes_that_contradict_each_other(world):
-    """Each is correct alone. Both databases are made nevertheless; with --werror, the status is 1."""
+    """Each is correct by itself. Both databases are made; with --werror, the exit status is 1."""
     world.write("a.cdefsrc", HEAD)
     world.write("b.cdefsrc", HEAD.replace(b"FirstKey=1\n", b"FirstKey=50\n"))
     said = (b"b.cdefsrc:3: warning: the class `Disk` is also in a.cdefsrc:3 [S611 shared-name]\n"
@@ -265,7 +265,7 @@ def test_sarif_has_the_place_of_the_other_class(world):
 
 
 def test_shows_how_far_it_is_on_a_terminal_only(world):
-    """And clears the line in the end; a terminal that cannot is left alone."""
+    """The progress line is removed at the end. A terminal that cannot remove a line does not get one."""
     sources(world, "a.cdefsrc", "b.cdefsrc")
     for terminal, shown in (("xterm", True), ("dumb", False)):
         master, slave = os.openpty()
@@ -295,7 +295,7 @@ def time_of(world):
     (("--timestamp=5",), {"VX_CDB_FORCE_EMPTY_TIMESTAMP": ""}, (0, 0)),
 ])
 def test_writes_the_time_that_is_asked_for(world, options, environment, expected):
-    """The option counts before the environment, and what cdgen obeys before both."""
+    """The option overrides SOURCE_DATE_EPOCH, and VX_CDB_FORCE_EMPTY_TIMESTAMP overrides both."""
     made(world, *options, "-o", OUT, SOURCE, set=environment)
     check(time_of(world) == expected, time_of(world))
     world.verified()
@@ -310,7 +310,7 @@ def test_writes_the_time_of_the_build(world):
 
 
 def test_refuses_times_that_are_none(world):
-    """Whoever gives them."""
+    """From the option and from the environment."""
     wanted = b" is not none, now or seconds from 0 to 4294967295\n"
     expect(build(world, "--timestamp=soon", SOURCE), 2, b"cdef: --timestamp: 'soon'" + wanted)
     expect(build(world, SOURCE, set={"SOURCE_DATE_EPOCH": "4294967296"}), 2,
@@ -338,7 +338,7 @@ def test_refuses_times_that_are_none(world):
     (("-d", SOURCE, SOURCE), b"class.cdefsrc: Not a directory"),
 ])
 def test_refuses(world, arguments, message):
-    """With a reason, status 2, and nothing written."""
+    """With a reason and status 2; nothing is written."""
     world.good()
     world.path("empty").mkdir()
     world.path("link").symlink_to(SOURCE)
@@ -348,7 +348,7 @@ def test_refuses(world, arguments, message):
 
 
 def test_takes_names_as_they_are(world):
-    """Also such as the command line's library would take apart."""
+    """Even names that the command line's library would change."""
     for name in ("[a,b]", "a b", "-o", "\xe4\n"):
         sources(world, f"./{name}.cdefsrc")
         made(world, "-o", f"./{name}", f"./{name}.cdefsrc")
@@ -358,7 +358,7 @@ def test_takes_names_as_they_are(world):
 
 
 def test_says_what_is_wrong_in_json_too(world):
-    """Of a source that cannot be read."""
+    """Including a source that cannot be read."""
     result = build(world, "--format=json", "missing", SOURCE)
     check(result.returncode == 2 and b"missing: cannot open" in result.stderr, result)
     json.loads(result.stdout)

@@ -20,7 +20,7 @@ FOR_MAKE_ONLY = ["end\\", "back\\ slash", "slash\\#", "a*", "a?", "<>", "^", "qu
 
 
 def tool(name):
-    """Where a build system is."""
+    """The path of a build system."""
     found = shutil.which(name)
     if found is None:
         pytest.skip(f"no {name} here")
@@ -28,31 +28,31 @@ def tool(name):
 
 
 def outdate(world, *names):
-    """Make files older than all others."""
+    """Makes files older than all others."""
     for name in names:
         os.utime(world.path(name), (5, 5))
 
 
 def touch(path):
-    """A time that no build system has seen, and after all others."""
+    """Sets a modification time that is later than all others."""
     newest = max(os.stat(other).st_mtime_ns for other in path.parent.iterdir())
     os.utime(path, ns=(newest + 1, newest + 1))
 
 
 def run(world, *command):
-    """What a build system says."""
+    """Runs a build system and returns its output."""
     result = subprocess.run(command, capture_output=True, text=True, timeout=60, **world.options())
     check(result.returncode == 0, *command, "says", result.stdout, result.stderr)
     return result.stdout
 
 
 def counted(world):
-    """How many times the command of the rule was run."""
+    """The number of times that the rule's command has been run."""
     return len(world.path("log").read_text().splitlines())
 
 
 def project(world, name):
-    """A script that builds the class and counts its runs; the source."""
+    """A script that builds the class and counts its runs, and the source."""
     script = world.path("build.sh")
     script.write_text(f'#!/bin/sh\necho run >>log\nexec {world.cdef} build --depfile=deps -o "$(cat target)" "$(cat source)"\n')
     script.chmod(0o755)
@@ -65,7 +65,7 @@ def project(world, name):
 
 @pytest.mark.parametrize("name", ODD_NAMES + FOR_NINJA_ONLY)
 def test_ninja_rebuilds_exactly_once_after_a_touch(world, name):
-    """The database stays as it is, and Ninja is content."""
+    """The database does not change, and Ninja then has nothing to do."""
     source, database = project(world, name), world.path(f"{name}.cdef")
     target = database.name.replace("$", "$$").replace(" ", "$ ").replace(":", "$:")
     world.path("build.ninja").write_text(
@@ -111,7 +111,7 @@ def test_make_rebuilds_exactly_once_after_a_change(world, name):
 
 
 def test_has_a_rule_for_each_source(world):
-    """With both databases of a source on one side."""
+    """The rule names both databases of a source."""
     for name in "ab":
         world.write(f"{name}.cdefsrc", HEAD)
     result = world.inspect("build", "--depfile=deps", "--byte-order=both", "-d", "o", "a.cdefsrc", "b.cdefsrc")
@@ -121,7 +121,7 @@ def test_has_a_rule_for_each_source(world):
 
 
 def test_is_not_written_if_a_database_is_not_made(world):
-    """Or a build system would take the failed one for a finished one."""
+    """Otherwise a build system would take the failed database for a finished one."""
     world.write("deps", b"old")
     world.write("a.cdefsrc", b"ControlDefinition\n")
     check(world.inspect("build", "--depfile=deps", "a.cdefsrc").returncode == 1, "no error")
@@ -130,7 +130,7 @@ def test_is_not_written_if_a_database_is_not_made(world):
 
 @pytest.mark.parametrize("name", ["a\nb", "a;b", "a|b"])
 def test_refuses_names_that_no_rule_can_have(world, name):
-    """Before anything is made."""
+    """Before any database is made."""
     world.write(f"{name}.cdefsrc", HEAD)
     result = world.inspect("build", "--depfile=deps", f"{name}.cdefsrc")
     message = b"cdef: --depfile: Make cannot read a name with a newline, a semicolon or a bar\n"

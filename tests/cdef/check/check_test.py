@@ -47,6 +47,6 @@ def test_case(name):
 
 
 def test_document():
-    """The example in docs/check.md; unit tests compare docs/messages.md with the tables."""
+    """The example in docs/check.md. (Unit tests compare docs/messages.md with the tables.)"""
     example = with_summary(expected_of(CASES / "disk.expect").get("stderr"))
     assert f"```\n{example}```\n" in (PROJECT / "docs/check.md").read_text()

@@ -1,4 +1,4 @@
-"""Test `cdef check --fix`: what it writes where, and what it leaves alone. What is corrected, unit tests show."""
+"""Test `cdef check --fix`: which files it writes, and which it leaves alone. Unit tests show what it corrects."""
 
 import os
 import stat
@@ -30,12 +30,12 @@ def source(directory):
 
 
 def alone(path):
-    """Nothing else is left in its directory."""
+    """Checks that nothing else is left in the source's directory."""
     same([each.name for each in path.parent.iterdir()], [path.name], "files")
 
 
 def test_file(source):
-    """It is corrected, keeps its mode, and nothing is left beside it."""
+    """The file is corrected and keeps its mode, and no other file is left beside it."""
     source.chmod(0o640)
     status, output, errors = check("--fix", source.name, cwd=source.parent)
     same((status, output), (0, ""), "status")
@@ -55,7 +55,7 @@ def test_again(source):
 
 
 def test_what_is_left(source):
-    """It is reported, with its lines after the correction."""
+    """The remaining findings are reported with their lines after the correction."""
     source.write_bytes(b"\xef\xbb\xbf" + WRONG.replace(b"FileVersion=", b"Colour="))
     status, _, errors = check("--fix", source.name, cwd=source.parent)
     same(status, 1, "status")
@@ -63,7 +63,7 @@ def test_what_is_left(source):
 
 
 def test_symbolic_link(source):
-    """What it leads to is replaced."""
+    """The file that the link points to is replaced."""
     link = source.parent / "link"
     link.symlink_to(source.name)
     status, _, _ = check("--fix", "link", cwd=source.parent)
@@ -72,7 +72,7 @@ def test_symbolic_link(source):
 
 
 def test_dry_run(source):
-    """A diff that patch understands; the file, its findings and the status are the old ones."""
+    """The output is a diff that patch understands. The file, its findings and the status do not change."""
     status, output, errors = check("--fix", "--dry-run", source.name, cwd=source.parent)
     same(status, 1, "status")
     assert output.startswith("--- a/x.cdefsrc\n+++ b/x.cdefsrc\n@@ -")
@@ -86,7 +86,7 @@ def test_dry_run(source):
 
 
 def test_standard_input(directory):
-    """The corrected source goes to standard output, or the diff."""
+    """The corrected source, or the diff, goes to standard output."""
     status, output, errors = check("--fix", "-", cwd=directory, stdin=WRONG)
     same((status, output.encode()), (0, SOUND), "source")
     assert errors.startswith("-: " + MESSAGE)
@@ -96,7 +96,7 @@ def test_standard_input(directory):
 
 
 def test_other_forms(source):
-    """The findings that are left; not where standard output is taken."""
+    """The remaining findings, unless standard output is needed for the source."""
     for form in ("json", "sarif"):
         source.write_bytes(WRONG)
         status, output, errors = check("--fix", "--format", form, source.name, cwd=source.parent)
@@ -119,7 +119,7 @@ def test_dropped_correction(source):
 
 
 def test_several_sources(source):
-    """One that cannot be read does not keep the others from being corrected."""
+    """If one cannot be read, the others are still corrected."""
     status, _, errors = check("--fix", "missing", source.name, cwd=source.parent)
     same(status, 2, "status")
     assert "missing: No such file or directory" in errors
@@ -127,7 +127,7 @@ def test_several_sources(source):
 
 
 def test_what_is_not_a_file(directory):
-    """A directory, a device."""
+    """Directories and devices are refused."""
     status, _, errors = check("--fix", ".", cwd=directory)
     assert status == 2 and ".: Is a directory" in errors
 

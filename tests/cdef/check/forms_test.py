@@ -1,6 +1,5 @@
-"""Test the forms in which `cdef check` shows findings: what is left out of the text and how it is coloured, and what the
-forms for other programs hold.  What is found, the cases of check_test.py test; SARIF, sarif_test.py does too.
-"""
+"""Test the forms in which `cdef check` shows findings: what the text omits, its colours, and what the other forms
+contain. The cases of check_test.py test which findings there are; sarif_test.py also tests SARIF."""
 
 import json
 import os
@@ -56,7 +55,7 @@ def check(directory):
 
 
 def kinds(text):
-    """E for each error, W for each warning, in their order."""
+    """E for each error and W for each warning, in their order."""
     return "".join(kind[0].upper() for _, kind in FINDING.findall(text))
 
 
@@ -65,7 +64,7 @@ ERRORS = "".join(f"Nonsense{number}\n" for number in range(30))
 
 
 def test_most(check):
-    """A hundred findings, warnings only where there are not enough errors; all are counted."""
+    """At most a hundred findings are shown, warnings only if there are fewer errors. All findings are counted."""
     status, _, text = check(WARNINGS)
     same((status, kinds(text)), (0, 100 * "W"), "status and kinds")
     assert text.endswith("\n0 errors and 110 warnings; 10 not shown (--max 0 shows all)\n")
@@ -75,7 +74,7 @@ def test_most(check):
 
 
 def test_max(check):
-    """Another number, or all; the status counts what is not shown."""
+    """Another number, or all. The status depends on hidden findings too."""
     same(kinds(check(WARNINGS + ERRORS, "--max", "20")[2]), 20 * "E", "20")
     same(kinds(check(WARNINGS + ERRORS, "--max", "0")[2]), 110 * "W" + 30 * "E", "all")
     warnings = check(WARNINGS, "--max", "1", "--werror")
@@ -93,7 +92,7 @@ def test_quiet(check):
 
 
 def test_others_are_complete(check):
-    """--max and -q are for text."""
+    """--max and -q affect text only."""
     for options in ((), ("--max", "1"), ("-q",)):
         for form, count in (("json", lambda text: len(json.loads(text)["sources"][0]["findings"])),
                             ("sarif", lambda text: len(json.loads(text)["runs"][0]["results"])),
@@ -126,7 +125,7 @@ def on_terminal(source, *options, **environment):
 
 
 def test_colours():
-    """On a terminal only, unless an option, NO_COLOR or TERM says otherwise."""
+    """Only on a terminal, unless an option, NO_COLOR or TERM decides otherwise."""
     source = "data-type.cdefsrc"
     plain = subprocess.run([PROGRAMS.cdef, "check", source], cwd=CASES, stderr=subprocess.PIPE).stderr.decode()
     coloured = on_terminal(source)
@@ -144,7 +143,7 @@ def test_colours():
 
 
 def test_names_are_listed_once(check):
-    """Each list, not each error."""
+    """Once for each list, not for each error."""
     status, _, text = check(SOUND + ATTRIBUTE.format("A", 1) + 5 * "\tZzzzzzzz=1\n" + 3 * "Zzzzzzzzz\n")
     same((status, kinds(text)), (1, 8 * "E"), "errors")
     lists = [line for line in text.splitlines() if "note: known are" in line]
@@ -152,7 +151,8 @@ def test_names_are_listed_once(check):
 
 
 def test_lines_of_the_file(check):
-    """Where the compiler counts a long line twice, JSON has both numbers, and the other forms have the file's."""
+    """If the compiler counts a long line twice, JSON has both line numbers, and the other forms have that of the file.
+    """
     long_comment = 300 * "#" + "\n"
     text = long_comment + SOUND.replace("Name=Pump", "Nmae=Pump")
     line = text.splitlines().index("\tNmae=Pump") + 1
@@ -170,7 +170,7 @@ def test_lines_of_the_file(check):
 
 
 def test_github():
-    """Commands, and nothing else."""
+    """There is nothing but commands."""
     shown = subprocess.run([PROGRAMS.cdef, "check", "--format", "github", "disk.cdefsrc", "missing"], cwd=CASES,
                            capture_output=True, text=True)
     expected = (
@@ -183,7 +183,7 @@ def test_github():
 
 
 def test_gitlab(check):
-    """What the report must have, and that fingerprints differ and stay."""
+    """The report has all required members; fingerprints differ and stay the same."""
     text = SOUND + 3 * "Nonsense\n"
     entries = json.loads(check(text, "--format", "gitlab")[1])
     for entry in entries:

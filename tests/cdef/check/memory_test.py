@@ -38,7 +38,7 @@ CASES += [(name, "text") for name in SOURCES if name != "different-headers"]
 
 
 def check(directory, head, line, form="text"):
-    """Check a source of such lines in the memory that is allowed; what is said on standard error."""
+    """Checks a source of such lines within the memory limit. Returns what standard error contains."""
     source = directory / "wrong"
     with source.open("w") as file:
         file.write(head)
@@ -51,7 +51,7 @@ def check(directory, head, line, form="text"):
 @pytest.mark.slow(30)
 @pytest.mark.parametrize(("name", "form"), CASES)
 def test_bound(directory, name, form):
-    """Every finding is written, or counted."""
+    """Every finding is either written or counted."""
     messages = check(directory, *SOURCES[name], form)
     if form == "text":
         same(messages.count(b": error: "), 100, "errors shown")
@@ -61,7 +61,7 @@ def test_bound(directory, name, form):
 @pytest.mark.slow(30)
 @pytest.mark.parametrize("name", CLASSES)
 def test_classes(directory, name):
-    """Of a class that has no error, nothing is kept that only its database would need."""
+    """Nothing that only a database would need is kept about a class without errors."""
     messages = check(directory, *CLASSES[name])
     same(messages.count(b": error: No class-to-manager maps defined"), 1, "errors shown")
     assert int(messages.splitlines()[-1].split()[3]) >= LINES, "warnings counted"

@@ -19,17 +19,17 @@ SCHEMA = jsonschema.Draft7Validator(json.loads((CASES.parent / "sarif_schema.jso
 
 
 def check(form, *sources):
-    """What is found in the sources, in a form."""
+    """The findings in the sources, in a form."""
     command = [PROGRAMS.cdef, "check", "--format", form, *sources]
     result = subprocess.run(command, cwd=CASES, capture_output=True, check=False, timeout=60)
     return json.loads(result.stdout)
 
 
 class Logs(unittest.TestCase):
-    """Logs of all kinds."""
+    """Logs about sources of all kinds."""
 
     def sarif(self, *sources):
-        """A log, which is checked."""
+        """A log, checked against the schema."""
         log = check("sarif", *sources)
         self.assertEqual([f"{error.json_path}: {error.message}" for error in SCHEMA.iter_errors(log)], [])
         (run,) = log["runs"]
@@ -77,7 +77,7 @@ class Logs(unittest.TestCase):
 
 
 class Properties(unittest.TestCase):
-    """What consumers do with a log."""
+    """Properties that consumers of a log rely on."""
 
     def run_on(self, text, name="a.cdefsrc"):
         """The run of a log about a text, and the directory's name in it."""
@@ -144,7 +144,7 @@ class Properties(unittest.TestCase):
 
 
 class Schema(unittest.TestCase):
-    """What the schema refuses."""
+    """The schema refuses wrong logs."""
 
     def test_changed_logs(self):
         good = check("sarif", "unknown-attribute.cdefsrc")

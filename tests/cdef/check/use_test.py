@@ -84,9 +84,9 @@ class Sources(unittest.TestCase):
 
 
 class ManyElements(unittest.TestCase):
-    """More of them than the attribute's highest index can count."""
+    """More elements than the attribute's highest index can count."""
 
-    def test_told_once(self):
+    def test_index_that_is_too_high_is_reported_once(self):
         head, _, tail = (CASES / "index-narrowed.cdefsrc").read_text().partition("PAttrSDDefinition\n")
         tail = tail[tail.index("ClassToManagerMapping"):]
         element = "PAttrSDDefinition\n\tElementName={0}\n\tDescription=1\n\tDisplayName=1\n\tElementIndex={0}\n\tDataType=None\n"
@@ -99,7 +99,7 @@ class ManyElements(unittest.TestCase):
 
 
 class ManyNames(unittest.TestCase):
-    """What is searched for names that are like one is bounded, or the work would be quadratic."""
+    """The search for similar names is bounded, because otherwise the work would be quadratic."""
 
     def test_searches_end(self):
         head, _, tail = (CASES / "variable-class-once.cdefsrc").read_text().partition("ResourceVariableClass\n")
@@ -155,7 +155,7 @@ class TooMany(unittest.TestCase):
 
 
 class Surroundings(unittest.TestCase):
-    """Errors that the source does not cause: streams and memory."""
+    """Errors that are not caused by the source: streams and memory."""
 
     def test_standard_error_that_is_full(self):
         for source, status in ((ODD, 2), (WRONG, 2), (RIGHT, 0)):
@@ -210,7 +210,7 @@ FOR_EDITORS = ("keys.cdefsrc", "long-line.cdefsrc", "unknown-attribute.cdefsrc",
 
 
 def findings_and_messages(test):
-    """What editors are tried with: findings with their files, and what is printed of them."""
+    """Findings with their files, and the output about them, for tests of editors."""
     status, text, messages = check("--format", "json", *FOR_EDITORS)
     test.assertEqual((status, messages), (1, ""))
     findings = [(each["file"], found) for each in json.loads(text)["sources"] for found in each["findings"]]
@@ -219,7 +219,7 @@ def findings_and_messages(test):
 
 
 class Editors(unittest.TestCase):
-    """What the files for editors make of messages, with a column and without one; for vim see vim_test.py."""
+    """How the files for editors read messages with and without a column; vim_test.py does the same for Vim."""
 
     def setUp(self):
         self.findings, self.messages = findings_and_messages(self)

@@ -1,4 +1,5 @@
-"""Test what vim, with the file that is made for it, reads out of the messages of `cdef check`.
+"""Test how Vim, with the files that are installed for it, reads the messages of `cdef check`. Skipped if Vim is not
+installed.
 
 Where there is no vim, it is skipped and says so.
 """
@@ -15,7 +16,7 @@ import use_test as use
 
 @unittest.skipIf(shutil.which("vim") is None, "there is no vim")
 class Vim(unittest.TestCase):
-    """Its list of errors, with a column and without one."""
+    """Vim's list of errors, with and without a column."""
 
     def test_list(self):
         findings, messages = use.findings_and_messages(self)

@@ -25,7 +25,7 @@ def status_and_octal(world, *arguments, **more):
 @pytest.mark.parametrize("command", COMMANDS)
 @pytest.mark.parametrize("name", [b"octal", b"S509", b"all"])
 def test_turns_warnings_off(world, command, name):
-    """By name, by code, or all of them; the command line turns one on again."""
+    """By name, by code, or all of them; the command line can turn one on again."""
     world.write(SOURCE, ODD)
     project(world, b"[warnings]\noff = ['%s']\n" % name)
     check(status_and_octal(world, *command, SOURCE) == (0, False), "reported")
@@ -44,7 +44,7 @@ def test_turns_a_warning_on_that_it_turns_off_too(world, command):
 
 @pytest.mark.parametrize("command", COMMANDS)
 def test_counts_warnings_as_errors(world, command):
-    """The options win, and exclude each other."""
+    """Options override the file and exclude each other."""
     world.write(SOURCE, ODD)
     project(world, b"warnings.werror = true\n")
     check(status_and_octal(world, *command, SOURCE) == (1, True), "does not count")
@@ -56,7 +56,7 @@ def test_counts_warnings_as_errors(world, command):
 
 @pytest.mark.parametrize("command", (("check",), ("build", "-d", "out")))
 def test_belongs_to_each_source_alone(world, command):
-    """The next one above it is the only one that counts."""
+    """Only the nearest file above the source is used."""
     for place, text in (("a", b"warnings.off = ['octal']\n"), ("a/b", b"warnings.werror = true\n")):
         project(world, text, place)
     for number, place in enumerate(("a/b", "a", ".")):
@@ -69,7 +69,7 @@ def test_belongs_to_each_source_alone(world, command):
 
 
 def test_takes_another_file_or_none(world):
-    """For all sources."""
+    """The option applies to all sources."""
     world.write(SOURCE, ODD)
     project(world, b"warnings.werror = true\n")
     world.write("other.toml", b"warnings.off = ['octal']\n")
@@ -80,7 +80,7 @@ def test_takes_another_file_or_none(world):
 
 
 def test_counts_for_standard_input(world):
-    """From the working directory."""
+    """The search begins in the working directory."""
     world.write(SOURCE, ODD)
     project(world, b"warnings.off = ['octal']\n")
     with open(world.path(SOURCE), "rb") as source:
@@ -88,7 +88,7 @@ def test_counts_for_standard_input(world):
 
 
 def test_chooses_directory_and_byte_order(world):
-    """Seen from the file; -d and --byte-order win, and -o needs no directory."""
+    """Relative to the file; -d and --byte-order override it, and with -o the directory is not needed."""
     project(world, b"[build]\ndirectory = 'made/here'\nbyte-order = 'both'\n", "p")
     world.write("p/a.cdefsrc", HEAD)
     expect(world.inspect("build", "--list", "p/a.cdefsrc"), 0, stdout=b"p/made/here/a.le.cdef\np/made/here/a.be.cdef\n")
@@ -101,7 +101,7 @@ def test_chooses_directory_and_byte_order(world):
 
 
 def test_makes_no_directory_for_a_missing_source(world):
-    """Only the one that a project file names."""
+    """Only a directory that a project file names is created."""
     check(world.inspect("build", "missing/a.cdefsrc").returncode == 2, "status")
     check(not world.path("missing").exists(), "made")
 

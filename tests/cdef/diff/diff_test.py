@@ -1,4 +1,4 @@
-"""Compare databases with cdef diff: what it says, and what it calls compatible.
+"""Compares databases with cdef diff: what it prints, and which differences it calls compatible.
 
 A case is a file below tests/cdef/diff in the notation of expectation.py, of
 these blocks:
@@ -47,7 +47,7 @@ class Programs:
         self.cdgen, self.cdef, self.directory = PROGRAMS.cdgen, PROGRAMS.cdef, pathlib.Path(directory)
 
     def compile(self, source, name, *options, stamp=False):
-        """Compile a text; the database's name."""
+        """Compiles a text. Returns the database's name."""
         environment = dict(os.environ)
         environment.pop("VX_CDB_FORCE_EMPTY_TIMESTAMP", None)
         if not stamp:
@@ -66,7 +66,7 @@ class Programs:
         return result.returncode, result.stdout.decode(), result.stderr.decode()
 
     def image(self, name, order, *changes):
-        """Write an image, with numbers of it changed and its checksum right; the database's name."""
+        """Writes an image with some numbers changed and a correct checksum. Returns the database's name."""
         data = bytearray(make_images.assemble(TESTS / "image" / f"{name}.image", order))
         for change in changes:
             make_images.change(data, "put", change, order)
@@ -76,7 +76,7 @@ class Programs:
         return path.name
 
     def patch(self, name, offset, data):
-        """Write bytes over those of a database."""
+        """Overwrites bytes of a database."""
         contents = bytearray((self.directory / name).read_bytes())
         contents[offset : offset + len(data)] = data
         (self.directory / name).write_bytes(contents)
@@ -88,7 +88,7 @@ def base():
 
 
 def replaced(source, old, new):
-    """The source with one run of whole lines in place of another."""
+    """The source with a run of whole lines replaced by another."""
     whole, lines = "\n" + source, "\n" + old
     if whole.count(lines) != 1:
         raise ValueError(f"stands {whole.count(lines)} times in the base: {old}")
@@ -96,7 +96,7 @@ def replaced(source, old, new):
 
 
 def read_case(path):
-    """The second source, and the expected texts by the options of the comparison."""
+    """The second source, and the expected outputs by the options of the comparison."""
     said = Expectation(path, (), BLOCKS)
     changes = said.all("replace", "with")
     if [name for name, _ in changes] != ["replace", "with"] * (len(changes) // 2):
@@ -112,7 +112,7 @@ def read_case(path):
 
 
 def turned(text):
-    """What the comparison the other way round says, its lines in any order."""
+    """The expected output of the reverse comparison, with its lines in any order."""
     lines = []
     for line in text.splitlines():
         words, _, values = line.partition(": ")
@@ -170,7 +170,7 @@ def programs(directory):
 
 
 def mentioned(a, b, source):
-    """What standard error says of two databases of the base and another source, by their names."""
+    """The messages on standard error for a comparison of the base with another source, by the names of both."""
     version = "\tFileVersion="
     before, after = (text.partition(version)[2].partition("\n")[0] for text in (base(), source))
     parts = [[int(part) for part in text.split(".")] for text in (before, after)]
@@ -180,7 +180,7 @@ def mentioned(a, b, source):
 
 @pytest.mark.parametrize("name", sorted(path.stem for path in CASES.glob("*.expect")))
 def test_case(programs, name):
-    """All comparisons of one case."""
+    """All comparisons of a case."""
     source, difference, compared = read_case(CASES / f"{name}.expect")
     databases = [
         (programs.compile(base(), f"a{order}.cdef", *order.split()), programs.compile(source, f"b{order}.cdef", *order.split()))
@@ -204,13 +204,13 @@ MAP = base().partition("ClassToManagerMapping\n")[2]
 
 
 def class_source(*stanzas, head="", control="ControlDefinition\n\tFileVersion=1.0.0.0\n"):
-    """A small source of given stanzas."""
+    """A small source with the given stanzas."""
     resource = "\tDescription=1\n\tDisplayName=2\n\tProperties=CanDefine\n\tClassPermTemplate=0\n\tResourcePermTemplate=0\n"
     return control + "ResourceClass\n" + resource + head + "".join(stanzas) + "ClassToManagerMapping\n" + MAP
 
 
 def attribute(name, number, *lines, kind="PersistentResourceAttribute", datatype="Int32"):
-    """A stanza of an attribute."""
+    """The stanza of an attribute."""
     given = [f"Name={name}", "Description=3", "DisplayName=4", f"Id={number}", f"DataType={datatype}", "VarietyRange=0,1"]
     if kind.startswith("Dynamic"):
         given.append("VariableType=State")
@@ -218,7 +218,8 @@ def attribute(name, number, *lines, kind="PersistentResourceAttribute", datatype
 
 
 def test_layout_is_not_compared(programs):
-    """The order of stanzas, of lines and of sections' contents, checksum, time and what nothing refers to."""
+    """Neither the order of stanzas, of lines and of the contents of sections, nor checksum, time, and bytes that
+    nothing refers to."""
     a, b = attribute("A", 1, "DefaultValue=5"), attribute("B", 2, "DefaultValue=x", "DefaultValue=y", datatype="String")
     d = attribute("D", 3, kind="DynamicClassAttribute")
     first = programs.compile(class_source(a, b, d, head="\tName=C\n"), "first.cdef")
@@ -229,7 +230,7 @@ def test_layout_is_not_compared(programs):
 
 
 def test_classes_are_named_where_there_are_several(programs):
-    """If one of the databases has two classes, the class is named."""
+    """If one of the databases has two classes, each line names the class."""
     control = "ControlDefinition\n\tFileVersion=1.0.0.0\n"
     resource = "ResourceClass\n\tDescription=1\n\tDisplayName=2\n\tProperties=CanDefine\n\tClassPermTemplate=0\n\tResourcePermTemplate=0\n"
     second = control + resource + "\tName=Second\n"
@@ -243,7 +244,7 @@ def test_classes_are_named_where_there_are_several(programs):
 
 
 def test_equal_names_pair_by_position(programs):
-    """Two attributes of one name are two; the one too many is the last."""
+    """Two attributes with the same name are two; if there is one too many, it is the last."""
     one = programs.compile(class_source(attribute("A", 1), attribute("A", 2), head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(*(attribute("A", i) for i in (1, 3, 4)), head="\tName=C\n"), "two.cdef")
     text = "~ PersistentResourceAttribute 'A': Id 2 -> 3\n+ PersistentResourceAttribute 'A'\n"
@@ -251,7 +252,7 @@ def test_equal_names_pair_by_position(programs):
 
 
 def test_texts_are_escaped(programs):
-    """Nothing of a name can act on a terminal."""
+    """No name can control a terminal."""
     one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(attribute("a\x1b[2J'\\\x7fü", 1), head="\tName=C\n"), "two.cdef")
     text = "+ PersistentResourceAttribute 'a\\x1b[2J\\'\\\\\\x7f\\xc3\\xbc'\n"
@@ -259,7 +260,7 @@ def test_texts_are_escaped(programs):
 
 
 def test_values_of_every_type(programs):
-    """How values read."""
+    """How values are shown."""
     values = {
         "Int32": ("-1", "-1"),
         "UInt64": ("18446744073709551615", "18446744073709551615"),
@@ -279,7 +280,7 @@ def test_values_of_every_type(programs):
 
 
 def test_missing_values_are_nothing(programs):
-    """An SD-typed attribute without a run has no value, and one with a run has elements and a value."""
+    """An attribute of type SD without a run has no value; one with a run has elements and a value."""
     run = "PAttrSDDefinition\n\tElementName=E\n\tDescription=1\n\tDisplayName=2\n\tElementIndex=0\n\tDataType=Int32\n"
     one = programs.compile(class_source(attribute("A", 1, datatype="SD"), head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(attribute("A", 1, datatype="SD"), run, head="\tName=C\n"), "two.cdef")
@@ -292,7 +293,7 @@ def test_missing_values_are_nothing(programs):
 
 
 def test_fields_without_a_line_are_compared(programs):
-    """Fields that no source sets: in the header, an anchor, the class, the manager and the map."""
+    """Fields that no source sets, in the header, an anchor, the class, the manager and the map."""
     name = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
     # Anchors stand at 80; the class at 128 has 224 bytes and strings of 8, the manager 24 and 16, then comes the map.
     places = {12: 1, 92: 2, 128 + 208: 3, 128 + 232 + 4: 4, 128 + 232 + 40 + 30: 5}
@@ -334,7 +335,7 @@ CHANGED_NUMBERS = [
 
 
 def test_records_that_are_never_written_are_compared(programs):
-    """Errors, dependencies and a class hash: the compiler makes none, but there may be some."""
+    """Errors, dependencies and a class hash. The compiler writes none, but a file may contain some."""
     for name, number, text in CHANGED_NUMBERS:
         for a, b in itertools.product(make_images.ORDERS, repeat=2):
             one, two = programs.image(name, a), programs.image(name, b, number)
@@ -343,14 +344,14 @@ def test_records_that_are_never_written_are_compared(programs):
 
 
 def test_places_in_a_class_hash_are_not_compared(programs):
-    """The head of a chain, a block's link and its class."""
+    """The head of a chain, a block's link, and its class."""
     for order in make_images.ORDERS:
         one, two = programs.image("hash", order), programs.image("hash", order, "u32 100 8", "u32 8296 9", "u32 8312 9")
         same(programs.diff(one, two), (0, "", ""), order)
 
 
 def differences_in(text):
-    """Those of a document in JSON."""
+    """The differences in a JSON document."""
     data = json.loads(text)
     same([f"{each.json_path}: {each.message}" for each in SCHEMA.iter_errors(data)], [], "against the schema")
     same(list(data), ["schema", "version", "before", "after", "differences", "mentions"], "members")
@@ -359,7 +360,7 @@ def differences_in(text):
 
 
 def test_json_says_the_same(programs):
-    """One object for each difference."""
+    """There is one object for each difference."""
     one = programs.compile(class_source(attribute("A", 1), attribute("B", 2), head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(attribute("A", 3), head="\tName=C\n"), "two.cdef")
     status, text, _ = programs.diff("--json", one, two)
@@ -384,7 +385,7 @@ def test_json_says_the_same(programs):
 
 
 def test_json_of_what_is_new_and_of_the_database(programs):
-    """A thing of its own has a path of its own, the database an empty one; what breaks nothing has no reason."""
+    """A new object has a path, the database an empty one. A difference that breaks nothing has no reason."""
     one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(attribute("A", 1), head="\tName=C\n"), "two.cdef")
     programs.patch(two, 12, b"\7")
@@ -396,7 +397,8 @@ def test_json_of_what_is_new_and_of_the_database(programs):
 
 
 def changed_values(programs, before, after):
-    """What becomes of fields when lines take the place of others: by field, the values with their types, if they have any."""
+    """The values of fields before and after a change of the source: for each field, both values and their types, if
+    any."""
     head = "\tName=C\n"
     one, two = (programs.compile(class_source(attribute("A", 1, *lines[1:], datatype=lines[0]), head=head), name)
                 for lines, name in ((before, "one.cdef"), (after, "two.cdef")))
@@ -424,12 +426,12 @@ TYPED = [
 
 @pytest.mark.parametrize("before, after, field, values", TYPED)
 def test_values_in_json_have_types(programs, before, after, field, values):
-    """Numbers are numbers, and so on; nothing is null."""
+    """A number is a number, and so on; no value is null."""
     same(changed_values(programs, before, after)[field], values, field)
 
 
 def test_entries_in_json_are_values_or_intervals(programs):
-    """Valid values as the attribute's type has them, and varieties."""
+    """Valid values have the type of the attribute; varieties are numbers."""
     gone = class_source(attribute("A", 1), head="\tName=C\n")
     given = attribute("A", 1, "VarietyRange=4,5", "ValidValue=-3", "ValidValue=7,9")
     one = programs.compile(gone, "one.cdef")
@@ -461,7 +463,7 @@ def test_json_has_all_differences(programs):
 
 
 def test_mentions_in_json(programs):
-    """Those of standard error, whatever the level."""
+    """The same as on standard error, whatever the level."""
     for level in ((), ("--compat",)):
         old, new = (class_source(head="\tName=C\n", control=f"ControlDefinition\n\tFileVersion=1.{minor}.0.0\n")
                     for minor in (10, 2))
@@ -475,7 +477,7 @@ def test_mentions_in_json(programs):
 
 
 def test_references_that_are_never_set_may_be_none(programs):
-    """"None" counts as the same place as 0, which is the default."""
+    """"None" is equal to 0, which the compiler writes."""
     for order in make_images.ORDERS:
         # Of a dynamic attribute of the class, which stands at 368, and of the manager, at 1328.
         one, two = programs.image("small", order), programs.image("small", order, "u32 392 -1", "u32 1344 -1")
@@ -486,7 +488,7 @@ def test_references_that_are_never_set_may_be_none(programs):
 
 
 def test_sections_of_unused_types_pair_by_type(programs):
-    """Their contents are not compared, but that they are there."""
+    """Their contents are not compared, only whether they exist."""
     for order in make_images.ORDERS:
         one = programs.image("sections", order)
         two = programs.image("sections", order, "u32 112 2", "u32 192 9")  # the third anchor's type, and contents
@@ -562,14 +564,14 @@ def same_text(count, length):
     )
 
 
-def test_values_of_another_are_not_told(programs):
-    """However many they are: nothing is out of proportion to the file."""
+def test_values_of_another_record_are_not_written(programs):
+    """However many there are, the output stays in proportion to the file."""
     (programs.directory / "many.cdef").write_bytes(values_of_another(100, 32767))
     same(programs.diff("many.cdef", "many.cdef"), (0, "", ""))
 
 
 def test_values_that_lead_to_one_text_too_often_are_refused(programs):
-    """If what would be written is out of proportion to the files; nothing is written of databases that are alike."""
+    """If the output would be out of proportion to the files. Databases that are alike are never refused."""
     (programs.directory / "few.cdef").write_bytes(same_text(10, 32767))
     (programs.directory / "many.cdef").write_bytes(same_text(1000, 32767))
     same(programs.diff("many.cdef", "many.cdef"), (0, "", ""), "the same")
@@ -590,8 +592,9 @@ def test_one_may_be_standard_input(programs):
     same(programs.diff("-", "-", stdin=contents)[:2], (2, ""), "both")
 
 
-def test_what_is_tolerated_is_told(programs):
-    """A wrong checksum and reserved bytes that are not 0: a line for each kind and database, whatever the status."""
+def test_tolerated_errors_are_reported(programs):
+    """A wrong checksum, and reserved bytes that are not 0: one line for each kind of error and each database, whatever
+    the status."""
     one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
     two = programs.compile(class_source(attribute("A", 1), head="\tName=C\n"), "two.cdef")
     programs.patch(two, 60, b"\1")  # two of the header's spare bytes, which cancel out in the checksum
@@ -605,8 +608,8 @@ def test_what_is_tolerated_is_told(programs):
     same(programs.diff("--compat", one, two), (0, "", said), "same")
 
 
-def test_trouble_is_status_2(programs):
-    """A file that is not there, that is no database, or that is broken."""
+def test_unreadable_and_unsound_files_are_status_2(programs):
+    """A file that does not exist, that is not a database, or that is broken."""
     one = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
     (programs.directory / "text").write_text("no database\n")
     programs.compile(class_source(head="\tName=C\n"), "broken.cdef")

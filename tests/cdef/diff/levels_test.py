@@ -1,5 +1,5 @@
-"""What cdef diff --compat finds at each level: each rule with a pair of sources that breaks it, and a similar pair that
-does not.
+"""Test what cdef diff --compat finds at each level: each rule has a pair of sources that breaks it, and a similar pair
+that does not. Both change base.cdefsrc. The rules are those of the table in docs/diff.md.
 
 Both change base.cdefsrc.  The rules are those of the table in docs/diff.md.
 """
@@ -16,13 +16,13 @@ from programs import PROJECT
 
 
 def documented():
-    """The rules of the document: code, level, reason."""
+    """The rules in the document: code, level, reason."""
     text = (PROJECT / "docs/diff.md").read_text()
     return re.findall(r"^\| `(CMP\d+)` \| `(\w+)` \| .* \| (.*) \|$", text, re.M)
 
 
 def compared(programs, changes, *options):  # noqa: F811
-    """What the comparison of the base with a changed one says."""
+    """The output of a comparison of the base with a changed source."""
     source = base()
     for old, new in changes:
         source = replaced(source, old, new)
@@ -39,7 +39,8 @@ def codes_of(text):
 
 @pytest.mark.parametrize("code,breaking,line,similar", RULES, ids=[rule[0] for rule in RULES])
 def test_rule(programs, code, breaking, line, similar):  # noqa: F811
-    """A rule is broken by one change and not by a similar one, and is shown from its own level on."""
+    """One change breaks the rule, a similar one does not. The difference is shown at the rule's level and at those
+    after it."""
     level = {known: level for known, level, _ in documented()}[code]
     status, text, _ = compared(programs, breaking, f"--compat={level}")
     same((status, line in [each[2:] for each in text.splitlines()]), (1, True), text)
@@ -51,12 +52,12 @@ def test_rule(programs, code, breaking, line, similar):  # noqa: F811
 
 
 def test_every_rule_has_its_pairs():
-    """No rule of the document is left out."""
+    """For all rules in the document."""
     same(sorted(rule[0] for rule in RULES), [code for code, _, _ in documented()])
 
 
 def test_levels_include_those_before(programs):  # noqa: F811
-    """What breaks readers is shown to all."""
+    """A difference that breaks readers is shown at every level."""
     change = [("\tId=10\n", "\tId=61\n"), ("\tPermission=x\n", "\tPermission=a\n")]
     number = f"~ {SERIAL}: Id 10 -> 61 (readers know it by its number)\n"
     permission = "~ ResourceAction 'Check': permission x -> a (clients may lack the permission)\n"
@@ -72,7 +73,7 @@ def test_unknown_level(programs):  # noqa: F811
 
 
 def test_lower_version_is_mentioned(programs):  # noqa: F811
-    """On standard error, whatever the level; a higher one is not."""
+    """On standard error, whatever the level. A higher version is not mentioned."""
     lower, higher = [("\tFileVersion=1.2.3.4\n", "\tFileVersion=1.2.3.3\n")], [("\tFileVersion=1.2.3.4\n", "\tFileVersion=1.10.3.4\n")]
     mention = "cdef: two.cdef: a lower version than one.cdef: 1.2.3.4 -> 1.2.3.3\n"
     same(compared(programs, lower, "--compat"), (0, "", mention), "--compat")
@@ -81,7 +82,7 @@ def test_lower_version_is_mentioned(programs):  # noqa: F811
 
 
 def test_renamed_in_json(programs):  # noqa: F811
-    """The path has the old name, beside it is the new one."""
+    """The path has the old name; the new one is beside it."""
     status, text, _ = compared(programs, [("\tName=List\n", "\tName=Lister\n")], "--json")
     found = json.loads(text)["differences"]
     reason = {"code": "CMP101", "level": "readers", "reason": "readers miss it"}

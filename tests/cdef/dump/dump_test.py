@@ -39,11 +39,11 @@ OTHER = {"little": "big", "big": "little"}
 
 
 class Failure(AssertionError):
-    """What a case found wrong."""
+    """A problem that a case has found."""
 
 
 def expect(actual, expected, what):
-    """Fail, with the difference, unless two things are equal."""
+    """Fails with the difference, unless the two are equal."""
     __tracebackhide__ = True
     compare.same(actual, expected, what)
 
@@ -52,7 +52,7 @@ def expect(actual, expected, what):
 
 
 def compile_source(source, *options):
-    """The database that a source becomes."""
+    """The database of a source."""
     with tempfile.TemporaryDirectory() as name:
         (pathlib.Path(name) / "source").write_bytes(source)
         environment = {**os.environ, "VX_CDB_FORCE_EMPTY_TIMESTAMP": ""}
@@ -72,7 +72,7 @@ def database(name, order="little"):
 
 
 def orders_of(name):
-    """The byte orders that a case can be had in; a hand-made image has hand-made bytes, in one order."""
+    """The byte orders in which a case exists. A hand-made image has hand-made bytes, so it has only one."""
     return ["little"] if (CASES / "listing" / f"{name}.image").exists() else ["little", "big"]
 
 
@@ -82,7 +82,7 @@ def patched(data, offset, new):
 
 
 def with_checksum(data):
-    """A little-endian database with its checksum made right."""
+    """A little-endian database with a correct checksum."""
     return patched(data, 4, struct.pack("<I", cdb_image.checksum(data, "little")))
 
 
@@ -90,7 +90,7 @@ def with_checksum(data):
 
 
 def dump(data, *options, status=OK, **settings):
-    """What cdef dump writes about a database on its standard input."""
+    """The output of cdef dump for a database on standard input."""
     command = [PROGRAMS.cdef, "dump", *options, "-"]
     result = subprocess.run(command, input=data, capture_output=True, timeout=TIMEOUT, **settings)
     expect(result.returncode, status, f"status of {' '.join(command[1:])}; {result.stderr!r}")
@@ -115,7 +115,7 @@ def no_constant(text):
 
 
 def parsed(text):
-    """JSON, strictly; members twice are an error."""
+    """Parses JSON strictly: a member that is given twice is an error."""
 
     def pairs(members):
         expect(len(dict(members)), len(members), f"distinct keys of {[key for key, _ in members]}")
@@ -176,7 +176,7 @@ HEX_LINE = re.compile(r"([0-9a-f]{8})  ((?:[0-9a-f]{2} ){0,15}[0-9a-f]{2})(?: {2
 
 
 def regions_of(text):
-    """(offset, bytes, name) of each region; lines that go on have 16 bytes before them."""
+    """(offset, bytes, name) of each region. Before a line that continues a region, there are lines of 16 bytes."""
     regions = []
     for line in text.splitlines():
         match = HEX_LINE.fullmatch(line)
@@ -194,7 +194,7 @@ def regions_of(text):
 
 
 def check_bytes(data, what):
-    """The annotated bytes are the file's, without gap or overlap; the regions."""
+    """Checks that the annotated bytes are those of the file, without gap or overlap. Returns the regions."""
     regions = regions_of(dump(data, "--hex"))
     end = 0
     for offset, octets, name in regions:
@@ -214,7 +214,7 @@ UNREACHED = {
 
 @pytest.mark.parametrize("name", LISTINGS)
 def test_regions(name):
-    """Annotated bytes of a file, of its beginnings, and of the file with a byte turned over."""
+    """The annotated bytes of a file, of its beginnings, and of the file with one byte inverted."""
     for order in orders_of(name):
         data = database(name, order)
         whole = check_bytes(data, f"{order}-endian")
@@ -230,7 +230,7 @@ def test_regions(name):
 
 
 def test_broken_structure_is_refused():
-    """The section's offset leads out of the file: only the bytes can be shown."""
+    """A section's offset is outside of the file, so only the bytes can be shown."""
     data = patched(database("minimal"), 84, b"\xff\xff\xff\x7f")
     for options in ([], ["--json"], ["--offsets"]):
         expect(
@@ -242,7 +242,7 @@ def test_broken_structure_is_refused():
 
 
 def test_no_database_is_refused():
-    """Nothing, and something else."""
+    """An empty file, and one that is not a database."""
     for data in (b"", b"#!/bin/sh\n" * 20):
         dump(data, status=TROUBLE)
     expect(dump(b"", "--hex"), "", "bytes of an empty file")
@@ -250,8 +250,8 @@ def test_no_database_is_refused():
     expect(regions, [(0, b"something else", "unreached")], "bytes of something else")
 
 
-def test_wrong_checksum_is_told():
-    """The display message number 2 became 3; 3 ^ 2 = 1 changes the word's upper half."""
+def test_wrong_checksum_is_shown():
+    """The display message number 2 is changed to 3; 3 ^ 2 = 1 is the change of the word's upper half."""
     data = patched(database("minimal"), 340, b"\x03")
     listing = expected_text("listing", "minimal").replace("rc_disp_msgid: 2", "rc_disp_msgid: 3")
     verdict = "cdb_hdr_checksum: wrong, 0xaf6f2186 in the place of 0xaf6f2187"
@@ -264,7 +264,7 @@ def test_wrong_checksum_is_told():
 
 
 def test_locator_of_no_attribute():
-    """The class has no attribute 7."""
+    """The class has no attribute with the number 7."""
     data = patched(database("minimal"), 342, b"\x07\x00")
     expect(re.findall("rc_locator.*", dump(data)), ["rc_locator: 7, unknown"], "listing")
     told = parsed(dump(data, "--json"))["sections"][0]["class"]["rc_locator"]
@@ -282,7 +282,7 @@ def test_time_is_utc():
 
 
 def test_offsets_in_json():
-    """Each record has its place, and its references as numbers."""
+    """Each record has its offset, and its references are numbers."""
     data = parsed(dump(database("minimal"), "--json", "--offsets"))
     expect(list(data["header"].items())[0], ("at", 0), "first member of the header")
     first = data["sections"][0]
@@ -307,7 +307,7 @@ def test_offsets_of_lists():
 
 
 def test_file_and_standard_input_alike():
-    """A name, and -."""
+    """The file is given by name, and as -."""
     data = database("minimal")
     with tempfile.NamedTemporaryFile() as file:
         file.write(data)
@@ -323,7 +323,7 @@ def run(*arguments, **settings):
 
 
 def test_missing_file():
-    """A file that is not there."""
+    """The file does not exist."""
     expected = (TROUBLE, "cdef: /nonexistent.cdef: No such file or directory\n")
     expect(run("/nonexistent.cdef"), expected, "status and message")
 
@@ -345,7 +345,7 @@ def test_output_that_cannot_be_written():
 
 
 def on_terminal(data, **environment):
-    """What cdef dump writes on a terminal."""
+    """The output of cdef dump on a terminal."""
     master, slave = pty.openpty()
     with tempfile.TemporaryFile() as file, os.fdopen(master, "rb", buffering=0) as screen:
         file.write(data)
@@ -364,7 +364,7 @@ def on_terminal(data, **environment):
 
 
 def test_colour_on_a_terminal_only():
-    """Headings in bold, nothing else; none with NO_COLOR."""
+    """Only headings are bold, and nothing is if NO_COLOR is set."""
     data = database("minimal")
     plain = expected_text("listing", "minimal")
     headings = re.compile(r"^( *)((?:header|section|class|manager|map)[^:\n]*)$", re.MULTILINE)
@@ -419,7 +419,7 @@ def test_texts_are_escaped():
 
 
 def test_texts_of_several_lines():
-    """No source makes one, but a file may have it."""
+    """No source gives such a text, but a file may contain one."""
     source = (CASES / "listing" / "minimal.cdefsrc").read_bytes()
     source += b"PersistentResourceAttribute\n\tName=A\n\tDescription=3\n\tDisplayName=4\n\tId=7\n"
     source += b'\tDataType=String\n\tVarietyRange=0,10\n\tDefaultValue="one?two"\n'
@@ -430,7 +430,7 @@ def test_texts_of_several_lines():
 
 
 def test_numbers_in_json():
-    """Integers are exact, floats have their digits, what JSON has no number for is text."""
+    """Integers are exact, floats have all their digits, and numbers that JSON cannot express are strings."""
     text = dump(database("types"), "--json")
     for number in ("-9223372036854775808", "18446744073709551615", "9007199254740993", "-9007199254740993"):
         if not re.search(rf"(?<![\d.-]){number}(?![\d.])", text):
@@ -450,7 +450,7 @@ def test_numbers_in_json():
 
 
 def test_class_hash():
-    """The section that is never written, with two blocks."""
+    """A section that the compiler never writes, with two blocks."""
     image = cdb_image.Image("little", "little")
     image.sections.append((7, 0))
     image.put(struct.pack("<I", 0x43444268) + bytes(8 * 1024) + struct.pack("<I", 2), "hash")
@@ -484,7 +484,7 @@ def test_class_hash():
 
 
 def test_sections_of_unused_types():
-    """They hold nothing that is known; the anchor is all there is to show."""
+    """Their contents have no known meaning, so only the anchor is shown."""
     image = cdb_image.Image("little", "little")
     for kind in (0, 1, 2):
         image.sections.append((kind, len(image.body)))
@@ -519,7 +519,7 @@ def test_annotated_values():
 
 
 def test_annotated_elements():
-    """Elements of arrays, and of lists of valid values, are of their owners' types."""
+    """Elements of arrays and of lists of valid values have the types of their owners."""
     names = re.sub(r"(?m)^.{59}|\d+ at [0-9a-f]{8} ", "", dump(database("FileSystem"), "--hex"))
     for some in (
         ("vx_array_t 0, element_count: 2", "vx_array_t 0, pad", 'vx_value_t 0: "rw"', 'vx_value_t 1: "noatime"'),
@@ -536,7 +536,7 @@ def test_annotated_elements():
 
 
 def test_annotated_bytes_are_in_proportion():
-    """A thousand names of one long text: each reference shows its beginning only."""
+    """A thousand names refer to the same long text, and each reference shows only its beginning."""
     name = "x" * 200
     lists = "".join(f"variety_list_t:g {i},{i}\n" for i in range(1000))
     actions = "".join(f"rsrc_action_t:b u_ac_name=0 u_ac_variety_list={16 * i} u_ac_sd_input=none u_ac_sd_resp=none\n"
@@ -557,7 +557,7 @@ rsrc_class_t:1 u_rc_alias=none u_rc_pattrsC=224 u_rc_dattrsC=224 u_rc_pattrs=224
 
 
 def test_value_of_another_type():
-    """A range that a class attribute's stanza left in a resource attribute: its numbers lead nowhere."""
+    """A range that a class attribute's stanza has stored in a resource attribute: its numbers are not references."""
     source = (CASES / "listing" / "minimal.cdefsrc").read_bytes()
     source += b"DynamicResourceAttribute\n\tName=Text\n\tDescription=3\n\tDisplayName=4\n\tId=7\n"
     source += b"\tDataType=StringArray\n\tVariableType=State\n\tVarietyRange=0,10\n"

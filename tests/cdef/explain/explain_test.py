@@ -1,4 +1,4 @@
-"""Test `cdef explain`. That the examples have their codes, a unit test shows."""
+"""Test `cdef explain`. A unit test shows that each example has its code."""
 
 import json
 import re
@@ -59,18 +59,18 @@ def test_several_codes():
 
 
 def test_name_of_a_warning():
-    """The same as its code, which it shows."""
+    """It gives the same explanation as the code, which is shown."""
     same(explain("octal"), explain("S509"), "octal")
     assert explain("octal")[1].startswith("S509: warning: a leading 0 makes a number octal [octal]\n\nCause:\n")
 
 
 def test_example_that_cannot_be_cured_alone():
-    """It is shown without."""
+    """It is shown without a cured source."""
     assert "\nExample:\n" in explain("S118")[1] and "\nCured:\n" not in explain("S118")[1]
 
 
 def test_list():
-    """All codes, with what they are."""
+    """All codes with their titles."""
     status, output, errors = explain()
     lines = output.splitlines()
     same((status, errors, lines[0]), (0, "", "S101    Invalid table name"), "list")
@@ -80,7 +80,7 @@ def test_list():
 
 
 def test_number_that_contradicts_the_file():
-    """Its code is not one of verification, but verify reports it."""
+    """The library never reports this code, but cdef verify does."""
     assert explain("CDB108")[1].startswith("CDB108: error: contradicts the rest of the file\n\nCause:\n")
     codes = [line.split()[0] for line in explain()[1].splitlines()]
     same(codes, sorted(codes, key=lambda code: (code.startswith("C"), code)), "order")
@@ -99,7 +99,7 @@ Cure:
 
 
 def test_codes_of_comparisons():
-    """Those of `cdef diff --compat`, and those of `cdef gate`."""
+    """The codes of `cdef diff --compat` and of `cdef gate`."""
     same(explain("CMP206"), (0, CMP206, ""), "CMP206")
     same(explain("unrecorded-number"), explain("CMP404"), "CMP404")
     table = (PROJECT / "docs/diff.md").read_text()
@@ -108,7 +108,7 @@ def test_codes_of_comparisons():
 
 
 def test_unknown_code():
-    """Those that are one edit away are suggested, unless they are many. Numbers near each other mean nothing."""
+    """Codes that are one edit away are suggested, unless there are many."""
     near = (("octl", "octal"), ("unbalance", "unbalanced"), ("S502x", "S502"), ("s5O9", "S509, S519 or S529"))
     for given, meant in near:
         same(explain(given), (2, "", f"cdef: {given}: no such code; did you mean {meant}?\n"), given)
@@ -117,7 +117,7 @@ def test_unknown_code():
 
 
 def test_json():
-    """Whole sources as examples."""
+    """Examples are whole sources."""
     status, output, errors = explain("--format", "json", "S302", "S901")
     one, other = json.loads(output)["codes"]
     same((status, errors), (0, ""), "status")

@@ -1,4 +1,4 @@
-"""Test `cdef format`: what it writes where, and what it leaves alone. What becomes of a source, unit tests show."""
+"""Test `cdef format`: which files it writes, and which it leaves alone. Unit tests show how it changes sources."""
 
 import os
 import stat
@@ -45,7 +45,7 @@ def test_input(source):
 
 
 def test_in_place(source):
-    """The source is replaced, keeps its mode, and nothing is left beside it."""
+    """The source is replaced and keeps its mode, and no other file is left beside it."""
     source.chmod(0o640)
     same(cdef("-i", "x.cdefsrc", cwd=source.parent), (0, b"", ""), "result")
     same(source.read_bytes(), FORMATTED, "source")
@@ -62,7 +62,7 @@ def test_again(source):
 
 
 def test_link(source):
-    """A symbolic link stays, and what it leads to is replaced."""
+    """A symbolic link stays, and the file that it points to is replaced."""
     (source.parent / "link.cdefsrc").symlink_to("x.cdefsrc")
     same(cdef("-i", "link.cdefsrc", cwd=source.parent), (0, b"", ""), "result")
     assert (source.parent / "link.cdefsrc").is_symlink()
@@ -110,7 +110,7 @@ def test_errors(source, options):
 
 
 def test_unreadable(source):
-    """What cannot be read, and a database, is reported; the others are formatted."""
+    """Files that cannot be read, and databases, are reported; the other sources are formatted."""
     (source.parent / "x.cdef").write_bytes(b"\0" * 8 + b"1tmf" + b"\0" * 60)
     status, output, errors = cdef("none.cdefsrc", "x.cdef", "x.cdefsrc", cwd=source.parent)
     same((status, output), (2, FORMATTED), "result")

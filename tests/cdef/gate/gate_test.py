@@ -1,4 +1,5 @@
-"""Test what `cdef gate` finds, where in the source, and what it compares with what.
+"""Test what `cdef gate` finds, the lines of its findings, and what it compares with what. tests/cdef/diff tests the
+rules of `cdef diff --compat` themselves; the rules about recorded numbers are tested here.
 
 The rules and their pairs are those of `cdef diff --compat`, which tests/cdef/diff tests; those about recorded numbers are
 tested here."""
@@ -31,7 +32,7 @@ ACTION = "ResourceAction\n\tName={}\n\tDescription=5\n\tDisplayName=6\n\tId={}\n
 
 
 def changed(changes):
-    """The base with other lines in place of some."""
+    """The base with some lines replaced."""
     text = "\n" + BASE
     for old, new in changes:
         check(text.count("\n" + old) == 1, "not once in the base:", old)
@@ -40,7 +41,7 @@ def changed(changes):
 
 
 def write(world, name, text):
-    """A text file."""
+    """Writes a text file."""
     world.path(name).parent.mkdir(parents=True, exist_ok=True)
     world.write(name, text if isinstance(text, bytes) else text.encode())
 
@@ -53,7 +54,7 @@ def found(world, *arguments, **more):
 
 
 def codes(findings):
-    """With those in notes."""
+    """The codes of findings, including those in notes."""
     return ({each["code"] for each in findings} |
             {note["message"][-7:-1] for each in findings for note in each["notes"] if note["message"].endswith("]")})
 
@@ -68,7 +69,7 @@ def with_class(*stanzas):
 
 @pytest.mark.parametrize("code,breaking,line,similar", RULES, ids=[rule[0] for rule in RULES])
 def test_rule(world, code, breaking, line, similar):
-    """From its level on, with the line of the source; not by the similar change."""
+    """At its level and those after it, with the line of the source. A similar change does not break it."""
     levels = {"1": "readers", "2": "clients", "3": "stored"}
     level = levels[code[3]]
     write(world, "old.cdefsrc", BASE)
@@ -87,7 +88,7 @@ def test_rule(world, code, breaking, line, similar):
 
 
 def test_every_rule_has_its_line():
-    """No rule is left out."""
+    """For all rules."""
     check([rule[0] for rule in RULES] == list(LINES), "rules")
 
 
@@ -103,7 +104,7 @@ def test_is_silent_against_itself(world, level):
 
 
 def test_shows_what_breaks(world):
-    """As text; by default what breaks readers."""
+    """As text. By default, only changes that break readers."""
     write(world, "old.cdefsrc", with_class(ATTRIBUTE.format("Size", 1, "Int32")))
     write(world, "new.cdefsrc", with_class(ATTRIBUTE.format("Size", 2, "Int32")))
     line = HEAD.count(b"\n") + 5
@@ -114,7 +115,7 @@ def test_shows_what_breaks(world):
 
 
 def test_shows_databases_without_lines(world):
-    """There is no source to show."""
+    """A database has no lines."""
     for number in (1, 2):
         write(world, SOURCE, with_class(ATTRIBUTE.format("Size", number, "Int32")))
         expect(world.inspect("build", "-o", f"{number}.cdef", SOURCE), 0)
@@ -125,7 +126,7 @@ def test_shows_databases_without_lines(world):
 
 @pytest.mark.parametrize("form", ["sarif", "github", "gitlab"])
 def test_has_the_forms_of_check(world, form):
-    """With the code and the line."""
+    """Each finding has its code and its line."""
     write(world, "old.cdefsrc", with_class(ATTRIBUTE.format("Size", 1, "Int32")))
     write(world, "new.cdefsrc", with_class(ATTRIBUTE.format("Size", 2, "Int32")))
     result = world.inspect("gate", "--format", form, "--against=old.cdefsrc", "new.cdefsrc")
@@ -137,7 +138,7 @@ def test_has_the_forms_of_check(world, form):
 
 
 def test_names_a_nameless_class_after_the_older_one(world):
-    """Which has been called after its database."""
+    """The older version is called after its own database."""
     nameless = HEAD.replace(b"\tName=Disk\n", b"")
     write(world, "new.cdefsrc", nameless)
     world.path("old").mkdir()
@@ -151,7 +152,7 @@ def test_names_a_nameless_class_after_the_older_one(world):
 
 
 def test_looks_for_the_file_in_a_directory(world):
-    """A database before a source; a class that is new has none."""
+    """A database is preferred to a source. A new class has no older version."""
     old, new = with_class(ATTRIBUTE.format("Size", 1, "Int32")), with_class(ATTRIBUTE.format("Size", 2, "Int32"))
     write(world, "new/a.cdefsrc", new)
     world.path("old").mkdir()
@@ -172,7 +173,7 @@ def git(world, *arguments):
 
 
 def test_takes_older_versions_from_git(world):
-    """The same file at a revision, or a file or directory there."""
+    """The same file at a revision, or a file or directory at that revision."""
     old, new = with_class(ATTRIBUTE.format("Size", 1, "Int32")), with_class(ATTRIBUTE.format("Size", 2, "Int32"))
     write(world, "classes/a.cdefsrc", old)
     git(world, "init", "-q", ".")
@@ -274,7 +275,7 @@ def test_does_not_know_what_a_damaged_older_version_had(world):
 
 
 def test_refuses_older_versions_that_are_not_there(world):
-    """Neither files nor revisions nor git."""
+    """Missing files, missing revisions, and no git."""
     write(world, "a.cdefsrc", HEAD)
     expect(world.inspect("gate", "--against=none", "a.cdefsrc"), 2, b"cdef: none: No such file or directory\n")
     expect(world.inspect("gate", "a.cdefsrc"), 2,
@@ -293,7 +294,7 @@ def test_refuses_older_versions_that_are_not_there(world):
 
 
 def test_refuses_what_cannot_be_compared(world):
-    """Sources with errors are shown as check shows them; older versions with errors are not compared with."""
+    """Errors in sources are shown as by cdef check. An older version with errors is refused."""
     wrong = HEAD.replace(b"Description=1", b"Descripton=1", 1)
     write(world, "good.cdefsrc", HEAD)
     write(world, "wrong.cdefsrc", wrong)
@@ -318,7 +319,7 @@ def recorded(world, *stanzas, name="ids.lock"):
 
 
 def test_records_numbers_forever(world):
-    """In a fixed order, each once; those that are gone stay."""
+    """In a fixed order, each once. Numbers that are no longer used stay."""
     size, mode = "Disk\tPersistentResourceAttribute\t1\tInt32\tSize", "Disk\tDynamicResourceAttribute\t2\tString\tMode"
     check_action = "Disk\tResourceAction\t1\t-\tCheck"
     stanzas = (DYNAMIC.format("Mode", 2, "String"), ATTRIBUTE.format("Size", 1, "Int32"), ACTION.format("Check", 1))
@@ -358,7 +359,7 @@ def test_records_numbers_beside_the_source(world):
      ATTRIBUTE.format("Size", 2, "UInt32")),
 ])
 def test_refuses_a_number_that_was_something_else(world, code, first, second, similar):
-    """Unless it is accepted with --update; another number, or that of another kind of object, is new."""
+    """Unless --update accepts it. Another number, or the same number of another kind of object, is new."""
     recorded(world, first)
     recorded(world)
     write(world, "a.cdefsrc", with_class(second))
@@ -373,7 +374,7 @@ def test_refuses_a_number_that_was_something_else(world, code, first, second, si
 
 
 def test_warns_of_numbers_that_are_not_recorded(world):
-    """An error with --werror."""
+    """With --werror, this is an error."""
     recorded(world)
     write(world, "a.cdefsrc", with_class(ATTRIBUTE.format("Size", 1, "Int32")))
     line = HEAD.count(b"\n") + 5
@@ -384,7 +385,7 @@ def test_warns_of_numbers_that_are_not_recorded(world):
 
 
 def test_refuses_files_of_numbers_that_say_something_else(world):
-    """Or two things; with the line."""
+    """Invalid and contradictory files are refused, with the line."""
     write(world, "a.cdefsrc", HEAD)
     line = "Disk\tPersistentResourceAttribute\t1\tInt32\tSize\n"
     expect(world.inspect("gate", "--ids=none", "a.cdefsrc"), 2, b"cdef: none: No such file or directory\n")
@@ -404,7 +405,7 @@ def test_refuses_files_of_numbers_that_say_something_else(world):
 
 
 def test_reads_the_project_file(world):
-    """Level, older version, numbers and --werror; options win."""
+    """Level, older version, numbers and --werror; options override them."""
     change = RULES[13]
     check(change[0] == "CMP209", change)
     write(world, "p/old/a.cdefsrc", BASE)
@@ -422,6 +423,6 @@ def test_reads_the_project_file(world):
 
 
 def test_document_has_the_rules():
-    """Those about numbers."""
+    """The rules about numbers."""
     text = (PROJECT / "docs/gate.md").read_text()
     check(all(f"| `CMP40{number}` |" in text for number in range(1, 5)), "rules")

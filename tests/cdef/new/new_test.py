@@ -13,7 +13,7 @@ NAMES = ["Fan", "a b", "a#b", "a // b", "/* a", "\"a\"", "a\"b", "'", "Name=Fan"
 
 @pytest.mark.parametrize("name", NAMES)
 def test_compiles_without_a_warning(world, name):
-    """Whatever the name; and it is the class's."""
+    """Whatever the name is. The class has that name."""
     expect(world.inspect("new", "class", "-o", "x.cdefsrc", "--", name), 0)
     expect(world.inspect("build", "--werror", "-o", "x.cdef", "x.cdefsrc"), 0)
     check(name.encode() + b"\0" in world.read("x.cdef"), "another name")
@@ -35,7 +35,7 @@ def test_writes_to_standard_output(world):
 
 
 def test_never_overwrites(world):
-    """Neither a file nor what a link leads to."""
+    """Neither a file nor the target of a link."""
     world.write("Fan.cdefsrc", b"mine")
     world.path("link").symlink_to("Fan.cdefsrc")
     world.path("nowhere").symlink_to("missing")
@@ -46,7 +46,7 @@ def test_never_overwrites(world):
 
 
 def test_leaves_no_part_of_a_source(world):
-    """If the file may not grow."""
+    """If the file cannot be written completely."""
     result = world.inspect("new", "class", "Fan",
                            preexec_fn=lambda: resource.setrlimit(resource.RLIMIT_FSIZE, (100, 100)))
     check(result.returncode == 2 and result.stderr.startswith(b"cdef: Fan.cdefsrc: "), result)
@@ -55,12 +55,12 @@ def test_leaves_no_part_of_a_source(world):
 
 @pytest.mark.parametrize("name", [b"", b"a\nb", b"a\rb", b"x" * 300])
 def test_refuses_names_that_no_source_gives(world, name):
-    """And writes nothing."""
+    """Nothing is written."""
     result = world.inspect("new", "class", "-o", "x.cdefsrc", name)
     check(result.returncode == 2 and result.stderr.endswith(b": a source cannot give a class this name\n"), result)
     check(not world.path("x.cdefsrc").exists(), "written")
 
 
 def test_knows_no_other_kinds(world):
-    """Yet."""
+    """There is only the kind class so far."""
     check(world.inspect("new", "action", "Fan").returncode == 2, "status")

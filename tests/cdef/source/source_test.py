@@ -1,4 +1,4 @@
-"""Write sources with cdef source: what they look like, and that they compile back.
+"""Test cdef source: what its sources look like, and that they compile to the same database.
 
 A case is tests/cdef/source/NAME.cdefsrc, which is compiled, or NAME.image, a
 database described as cdb_image.py says; and beside it NAME.expect, in the
@@ -65,7 +65,7 @@ class Programs:
 
 
 def round_trip(programs, source, out="out.cdef", swap=False):
-    """The problems of one source on its way back; None if it does not compile."""
+    """The problems of a source that is compiled and turned back into a source; None if it does not compile."""
     with tempfile.TemporaryDirectory() as name:
         directory = pathlib.Path(name)
         first, _ = programs.compile(directory, source, out, swap)
@@ -101,7 +101,7 @@ def both_orders(programs, source, out="out.cdef"):
 
 
 def golden_sources():
-    """(name, text, output file) of all sources that compile."""
+    """(name, text, output file) of all golden sources that compile."""
     for path in golden.cases_below(TESTS / "golden"):
         case = golden.Case(path)
         if case.status == 0:
@@ -109,14 +109,14 @@ def golden_sources():
 
 
 def plain_sources():
-    """The same of those without an expectation."""
+    """The same for sources without an expectation."""
     for directory in (TESTS / "twins", TESTS.parent / "examples", TESTS / "cdef" / "diff", CASES):
         for path in sorted(directory.glob("*.cdefsrc")):
             yield path.stem, path.read_bytes(), "out.cdef"
 
 
 def check_sources(programs, sources):
-    """Every one of the sources compiles, and comes back."""
+    """Checks that each source compiles and can be turned back into a source."""
     problems = []
     count = 0
     for name, text, out in sources:
@@ -127,7 +127,7 @@ def check_sources(programs, sources):
 
 
 def check_generated(programs, group):
-    """Generated sources come back; most of them have to compile."""
+    """Checks the same of generated sources, most of which must compile."""
     problems = []
     compiled = 0
     for seed in range(group * GENERATED_EACH, (group + 1) * GENERATED_EACH):
@@ -145,7 +145,7 @@ def check_generated(programs, group):
 
 
 def check_tolerated(programs):
-    """Of a database that is looked into though its checksum is wrong, that is said, and the source is the same."""
+    """A database with a wrong checksum is accepted with a message, and its source is the same."""
     with tempfile.TemporaryDirectory() as name:
         directory = pathlib.Path(name)
         text = (CASES / "canonical.cdefsrc").read_bytes()
@@ -175,7 +175,8 @@ def on_terminal(programs, directory):
 
 
 def check_terminal(programs):
-    """A terminal gets a source if there is nothing in it that the terminal would act on or hide."""
+    """A source is written to a terminal only if it contains nothing that could control the terminal or would be
+    invisible."""
     text = (CASES / "canonical.cdefsrc").read_bytes()
     refusal = f"cdef: {DATABASE}: the source contains characters that could control a terminal: write it to a file\n".encode()
     shown = [text.encode() for text in ("plain", "é €\U0001f600", "e\u0301")]
@@ -193,7 +194,7 @@ def check_terminal(programs):
 
 
 def refusals(programs, what, database, why):
-    """The problems of a database that has no source, for this reason."""
+    """The problems of a database that must be refused for this reason."""
     with tempfile.TemporaryDirectory() as name:
         result = programs.source(pathlib.Path(name), database)
     actual = (result.returncode, result.stdout, result.stderr.decode())
@@ -201,7 +202,7 @@ def refusals(programs, what, database, why):
 
 
 def check_sections(programs):
-    """Of a type that the compiler does not make, or with a revision."""
+    """Sections of a type that the compiler does not write, or with a revision, are refused."""
     problems = []
     for order in make_images.ORDERS:
         plain = make_images.assemble(TESTS / "image" / "hash.image", order)
@@ -239,7 +240,7 @@ CONDITIONS = ("u_ra_express=16", "u_ra_rearm_expr=16", "ra_expr_desc=3", "ra_rea
 
 
 def check_optional_fields(programs):
-    """Optional lines may follow only if there is a type and a variety."""
+    """Optional lines can follow only if there are a type and a variety."""
     problems = []
     for kind, fields in ((PERSISTENT, OPTIONAL), (DYNAMIC, OPTIONAL + CONDITIONS)):
         stanza = "Persistent" if kind is PERSISTENT else "Dynamic"
@@ -280,7 +281,7 @@ def dynamic_class(fields, of_class=()):
 
 
 def check_choices_that_never_end(programs):
-    """Each ID is in two lists, and no choice brings the last list about: looking for one ends all the same."""
+    """Each ID is in two lists, and no choice completes the last list. The search ends nevertheless."""
     ids = [*range(1, 31), *range(1, 31), 40, 41]
     lists = [[number] for number in range(1, 31)] * 2 + [[41, 40]]
     text = dynamic_class([f"ra_attr_id={number}" for number in ids])
@@ -293,7 +294,7 @@ def check_choices_that_never_end(programs):
 
 
 def check_too_many_mixtures(programs):
-    """Of many attributes of both kinds not all ways to mix them are tried; of a few they are."""
+    """If there are many attributes of both kinds, not all orders of the two are tried; if there are few, they are."""
     problems = []
     astray = (
         "ra_data_type=StringArray ra_init_value=StringArray:16 ra_min_value=StringArray:5 ra_max_value=StringArray:6"
@@ -336,7 +337,7 @@ def test_on_a_terminal(programs):
     none(check_terminal(programs))
 
 
-def test_what_is_tolerated_is_told(programs):
+def test_tolerated_errors_are_reported(programs):
     none(check_tolerated(programs))
 
 

@@ -53,7 +53,7 @@ def consequences(path):
 
 
 def test_github(count):
-    """A line for each cause; a file that cannot be read has one too."""
+    """A line for each cause, and for each file that cannot be read."""
     wrong = f"::error file={WRONG},title=CDB301::{WRONG_TEXT}\n"
     careless = f"::warning file={CARELESS},title=CDB353::{CARELESS_TEXT}\n"
     same(verify("github", WRONG, CARELESS, "small.little.cdef"), (1, wrong + careless), "two")
@@ -70,7 +70,7 @@ def test_github_with_all(count):
 
 
 def test_gitlab(count):
-    """An entry for each cause, at the first line, since a database has none."""
+    """An entry for each cause, at line 1, because a database has no lines."""
     status, text = verify("gitlab", WRONG, CARELESS, count, "none.cdef")
     entries = json.loads(text)
     wrong = {"description": WRONG_TEXT, "check_name": "CDB301", "fingerprint": entries[0]["fingerprint"], "severity": "major",
@@ -89,7 +89,7 @@ def test_fingerprints(count):
 
 
 def test_sarif():
-    """Offsets instead of lines, and rules that explain themselves."""
+    """It has offsets instead of lines, and explains the rules."""
     run = sarif(WRONG, CARELESS)
     rules = run["tool"]["driver"]["rules"]
     same(run["tool"]["driver"]["name"], "cdef verify", "tool")
@@ -105,7 +105,7 @@ def test_sarif():
 
 
 def test_sarif_folds_consequences(count):
-    """Consequences are kept, but not as results."""
+    """They are related locations, not results."""
     (result,) = sarif(count)["results"]
     same((result["ruleId"], result["message"]["text"]), ("CDB108", COUNT_TEXT), "cause")
     same(len(result["relatedLocations"]), consequences(count), "consequences")
@@ -121,6 +121,6 @@ def test_sarif_of_files_that_cannot_be_read():
 
 
 def test_sarif_of_all_images():
-    """Whatever is wrong, the log follows the schema."""
+    """The log follows the schema whatever is wrong."""
     images = sorted(str(path.relative_to(PROGRAMS.images)) for path in PROGRAMS.images.rglob("*.cdef"))
     assert len(sarif(*images)["results"]) > 50

@@ -1,5 +1,5 @@
-"""Test `cdef verify`: what it prints, its exit statuses, and that it finds no
-error in anything that the compiler makes.
+"""Test `cdef verify`: its output, its exit statuses, and that it finds no error in any database that the compiler
+makes.
 
 The images are those that support/make_images.py makes.
 """
@@ -74,7 +74,7 @@ def verify(*operands, stdin=subprocess.DEVNULL, stdout=subprocess.PIPE, data=Non
 
 
 class Output(unittest.TestCase):
-    """What is printed, and the statuses."""
+    """The output and the statuses."""
 
     def test_nothing_of_a_sound_database(self):
         for order in ("little", "big"):
@@ -118,7 +118,7 @@ class Output(unittest.TestCase):
 
 
 class Json(unittest.TestCase):
-    """The shape of --json."""
+    """The form of --json."""
 
     def parsed(self, expected_status, *operands):
         status, text, messages = verify("--json", *operands)
@@ -210,7 +210,7 @@ class Causes(unittest.TestCase):
 
 
 class Input(unittest.TestCase):
-    """Standard input, and what cannot be read."""
+    """Standard input, and files that cannot be read."""
 
     def test_standard_input(self):
         with open(PROGRAMS.images / WRONG, "rb") as file:
@@ -332,7 +332,7 @@ class Input(unittest.TestCase):
 
 
 class Usage(unittest.TestCase):
-    """Messages about a wrong command line: unknown options are reported before missing operands."""
+    """Messages about wrong command lines: unknown options are reported before missing operands."""
 
     MESSAGES = {
         ("dmp", "FILE"): "dmp: unknown subcommand",
@@ -447,14 +447,14 @@ STRAY_RANGES = {
 
 
 def expected_warnings():
-    """The codes of the warnings that each careless golden source is known for, by case."""
+    """The codes of the warnings about each careless golden source, by case."""
     lines = (TESTS / "cdef" / "verify" / "golden-warnings.txt").read_text().splitlines()
     cases = [line.split(": ") for line in lines if line and not line.startswith("#")]
     return {name: codes.split() for name, codes in cases}
 
 
 class Compiled(unittest.TestCase):
-    """What the compiler makes has no errors, and only careless sources have warnings."""
+    """Databases that the compiler makes have no errors, and only those of careless sources have warnings."""
 
     def expect_sound(self, database, what):
         self.assertEqual(verify("-q", database), (0, "", ""), what)

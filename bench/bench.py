@@ -42,7 +42,7 @@ MB = 1e6
 class Plan(typing.NamedTuple):
     """The sizes and repetitions of a measurement."""
 
-    small: int  # the two sizes between which growth is told
+    small: int  # the two sizes between which growth is measured
     large: int
     rounds: int
     start_rounds: int

@@ -127,7 +127,7 @@ def dynamic(kind, definition):
                    f"\tRange={definition.low},{definition.high}\n\tInitialValue={definition.default}\n")
 
 
-# Dynamic class attributes stand first, lest their ranges go to dynamic resource attributes that are still open.
+# Dynamic class attributes come first; otherwise their ranges would go to dynamic resource attributes that are open.
 KINDS = (("DynamicClassAttribute", dynamic), ("DynamicResourceAttribute", dynamic),
          ("PersistentClassAttribute", persistent), ("PersistentResourceAttribute", persistent))
 

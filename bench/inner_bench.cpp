@@ -1,4 +1,4 @@
-/* inner_bench.cpp: what the compiler's inner functions cost, one by one. Of use while one of them is being changed;
+/* inner_bench.cpp: the cost of the compiler's inner functions, one by one. Use it while you change one of them;
  * whether the whole got faster, only script/bench tells. */
 
 #include "compiler/cdgen.h"
@@ -16,7 +16,7 @@
 namespace {
 
 constexpr size_t TABLE_AU = 8192;
-constexpr size_t TABLE_MAX = size_t{1} << 20; /* bytes after which a measured table begins anew */
+constexpr size_t TABLE_MAX = size_t{1} << 20; /* bytes after which a measured table is emptied */
 
 /* A staging table that never outgrows the caches for long. */
 class bounded_table {

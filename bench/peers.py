@@ -13,7 +13,7 @@ from generate import definitions
 
 INTEGER_TYPES = ("Int32", "UInt32", "Int64", "UInt64")
 FLOAT_TYPES = ("Float32", "Float64")
-GROUP = 100  # definitions that stand together where all in one list would take time that grows with their square
+GROUP = 100  # definitions in a group, for programs whose time grows with the square of the length of a list
 
 
 class Peer(typing.NamedTuple):

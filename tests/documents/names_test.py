@@ -13,7 +13,7 @@ from documents import DOCUMENTS, PAGES, PROJECT, chapters, sources, spans, table
 from programs import PROGRAMS
 
 LANGUAGE, FORMAT = PROJECT / "docs/language.md", PROJECT / "docs/format.md"
-# Records that have no chapter of their own: entries of lists, and what stands in tables of other chapters.
+# Records that have no chapter of their own: entries of lists, and records in tables of other chapters.
 ENTRIES = {"vl_entry_t": "variety_list_t", "vv_entry_t": "valid_values_t", "sd_field_t": "sd_def_t",
            "sbs_field_t": "sbs_def_t", "rc_hash_block_t": "rsrc_class_hash_t"}
 # The members that hold the entries: the document has the entries themselves in their place.

@@ -15,7 +15,8 @@ namespace {
 
 using nlohmann::json;
 
-constexpr std::size_t ANSWER_MAX = 64UL * 1024 * 1024; /* bytes; what is sent at most for an input of a few KB */
+constexpr std::size_t ANSWER_MAX =
+    64UL * 1024 * 1024; /* the most bytes that the server may send for an input of a few KB */
 
 /* The identifier of a request as text; empty for anything else. */
 std::string request_id(const std::string &body) {
@@ -47,7 +48,7 @@ public:
             look_at(body);
     }
 
-    /* Requests after the end of the server are not answered. */
+    /* Requests that come after the server has ended are not answered. */
     void end() {
         work();
         for (const auto &[id, count] : open)

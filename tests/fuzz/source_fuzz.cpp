@@ -1,7 +1,7 @@
 /* source_fuzz: compiles arbitrary bytes, and examines the result.
  *
  * The first byte holds the options: bit 0 n, bits 1 and 2 the level of d, bit 3 s, bit 4 an output whose name no class
- * can take, bit 5 an output that exists, bits 6 and 7 a source that stands across the end of the read buffer. The rest
+ * can take, bit 5 an output that exists, bits 6 and 7 a source that extends across the end of the read buffer. The rest
  * is the source. Whatever it says, the compilation ends with a database or with status 1; a database is sound, and all
  * of it can be read; an error leaves the output as it was. */
 

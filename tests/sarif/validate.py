@@ -36,7 +36,7 @@ def logs(cdef, directory):
 
 
 def main():
-    """Whether all logs are valid."""
+    """Returns whether all logs are valid."""
     place, cdef = pathlib.Path(sys.argv[1]).resolve() / TOOL, pathlib.Path(sys.argv[2]).resolve()
     schema = json.loads((place / "sarif-2.1.0.json").read_text("utf-8-sig"))
     validator = jsonschema.validators.validator_for(schema)(schema)

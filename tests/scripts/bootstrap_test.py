@@ -1,4 +1,4 @@
-"""What script/bootstrap does on a system that has no apt-get."""
+"""Test script/bootstrap on a system that has no apt-get."""
 
 import os
 import shutil
@@ -8,7 +8,8 @@ from programs import PROJECT
 
 
 def bootstrap(directory, *programs):
-    """Status and output of script/bootstrap where only these programs exist, and what a shell script needs."""
+    """Status and output of script/bootstrap on a system that has only these programs, and those that a shell script
+    needs."""
     for name in ("sh", "dirname", "cat", "id"):
         (directory / name).symlink_to(shutil.which(name))
     for name in programs:
@@ -19,7 +20,7 @@ def bootstrap(directory, *programs):
 
 
 def test_says_what_is_needed_and_what_is_missing(directory):
-    """Nothing is installed, and building would fail."""
+    """Nothing is installed, and the status is not 0."""
     status, said = bootstrap(directory, "cmake")
     assert status == 1
     assert "has no apt-get, so nothing is installed. Not found: c++ ninja\n" in said
@@ -28,5 +29,5 @@ def test_says_what_is_needed_and_what_is_missing(directory):
 
 
 def test_is_quiet_where_the_programs_are(directory):
-    """Building may go on."""
+    """The status is 0."""
     assert bootstrap(directory, "c++", "cmake", "ninja") == (0, "")

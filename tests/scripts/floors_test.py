@@ -1,4 +1,4 @@
-"""The libraries of src/ rest only on those below them; and script/floors, which sees to that, finds what breaks it."""
+"""Test that the libraries of src/ use only those below them, and that script/floors finds what breaks this rule."""
 
 import importlib.machinery
 import importlib.util
@@ -21,7 +21,7 @@ def floors():
 
 
 def library(directory, folder, **sources):
-    """A static library as a build has it: in src/FOLDER, its object files beside it."""
+    """A static library as a build leaves it: in src/FOLDER, with its object files beside it."""
     place = directory / "src" / folder
     objects = place / "CMakeFiles" / f"{folder}.dir"
     objects.mkdir(parents=True)

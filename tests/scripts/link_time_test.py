@@ -1,4 +1,4 @@
-"""Builds for use are optimised when they are linked, without a preset; the library that is installed is not."""
+"""Test that release builds are optimised at link time, with or without a preset, and that the installed library is not."""
 
 import json
 import subprocess
@@ -8,7 +8,7 @@ from programs import PROJECT
 
 
 def optimised(directory, *settings):
-    """The source folders that a build with these settings compiles for link-time optimisation."""
+    """The source folders that a build with these settings compiles for optimisation at link time."""
     subprocess.run(["cmake", "-S", PROJECT, "-B", directory, *settings], stdout=subprocess.DEVNULL, check=True)
     commands = json.loads((directory / "compile_commands.json").read_text())
     sources = {row["file"]: row["command"] for row in commands}

@@ -1,4 +1,4 @@
-"""Which changes script/mutate makes."""
+"""Test which changes script/mutate makes."""
 
 import pytest
 
@@ -31,12 +31,12 @@ def test_changes(text, expected):
     "uint32_t a1;", "1.5f", "1'000", "static_assert(a == 1);",
 ])
 def test_leaves_alone(text):
-    """Texts, comments, types, names, and what only the compiler sees."""
+    """Texts, comments, types, names, and code that only the compiler evaluates."""
     assert changes(text) == []
 
 
 def test_an_id_moves_with_its_line():
-    """The same line further down has the same changes; a second one like it has others."""
+    """The same line further down has the same ids; a second equal line has others."""
     (one,) = MUTATE.mutants_of("x.cpp", "a == b;\n")
     moved, second = MUTATE.mutants_of("x.cpp", "\n\na == b;\na == b;\n")
     assert (moved.id, moved.line) == (one.id, 3)

@@ -1,4 +1,4 @@
-"""Warnings are errors where cdgen is developed, and nowhere else: another compiler has other warnings."""
+"""Test that warnings are errors only in the presets for developers: another compiler has other warnings."""
 
 import json
 
@@ -10,7 +10,7 @@ DEVELOPERS = {"test", "clang", "debug", "sanitize", "threads", "i686", "armhf"}
 
 
 def variables(name):
-    """A preset's cache variables, with those that it inherits."""
+    """A preset's cache variables, including those that it inherits."""
     preset = PRESETS[name]
     inherited = variables(preset["inherits"]) if "inherits" in preset else {}
     return {**inherited, **preset.get("cacheVariables", {})}

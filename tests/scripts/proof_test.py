@@ -1,4 +1,4 @@
-"""What script/proof keeps in mind."""
+"""Test what script/proof records."""
 
 import json
 
@@ -8,7 +8,7 @@ PROOF = script("proof")
 
 
 def test_what_is_done_counts_for_its_sources_only(directory, monkeypatch):
-    """Portions of other sources, and of steps that are no more, are not counted."""
+    """Portions of other sources, and of steps that no longer exist, are not counted."""
     monkeypatch.setattr(PROOF, "DONE", directory / "done.jsonl")
     assert PROOF.recorded("now")["sources"] == {}
     records = [{"step": step, "portion": portion, "sources": sources}
@@ -19,14 +19,14 @@ def test_what_is_done_counts_for_its_sources_only(directory, monkeypatch):
 
 
 def test_portions_add_up():
-    """Every step has whole portions, and a command that knows which it is where there are several."""
+    """Every step has whole portions. If it has several, its command contains the number of the portion."""
     for name, step in PROOF.STEPS.items():
         assert step.portions * step.portion == step.total, name
         assert step.portions == 1 or "{portion}" in step.command or name == "mutants", name
 
 
 def test_failure_is_not_recorded(directory, monkeypatch, capsys):
-    """So that the next run tries it again; what was said is shown."""
+    """The next run tries it again. The output is shown."""
     monkeypatch.setattr(PROOF, "PLACE", directory)
     monkeypatch.setattr(PROOF, "DONE", directory / "done.jsonl")
     steps = {"good": PROOF.Step("", "", 2, 1, "echo {portion} passed"), "bad": PROOF.Step("", "", 1, 1, "echo broken; false")}

@@ -1,4 +1,4 @@
-"""Run a program in the memory that its inputs allow it: 8 times their size and 16 MB.
+"""Run a program with as much memory as its inputs allow: 8 times their size plus 16 MB.
 
 The limit is one of the address space, so that nothing depends on what else the machine does.
 """

@@ -1,4 +1,4 @@
-"""A directory to run the programs in, and what is expected of a run."""
+"""A directory in which tests run the programs, and the expected results of a run."""
 
 import contextlib
 import os
@@ -48,19 +48,19 @@ PersistentResourceAttribute
 
 
 def check(holds, *what):
-    """Fail the case unless the condition holds."""
+    """Fails the case unless the condition holds."""
     __tracebackhide__ = True
     if not holds:
         raise AssertionError(" ".join(map(str, what)))
 
 
 def attributes(count):
-    """So many persistent attributes."""
+    """A source part with so many persistent attributes."""
     return b"".join(ATTRIBUTE % (i, i, i) for i in range(count))
 
 
 class World:
-    """A directory of its own with the program, a source, and what runs there."""
+    """A directory with the program and a source, in which a test runs the programs."""
 
     def __init__(self, programs, directory):
         self.directory = directory
@@ -76,7 +76,7 @@ class World:
         return self.directory / name
 
     def write(self, name, contents):
-        """A file that everybody may read and write."""
+        """Writes a file that everybody may read and write."""
         self.path(name).write_bytes(contents)
         os.chmod(self.path(name), 0o666)
 
@@ -85,33 +85,33 @@ class World:
         return self.path(name).read_bytes()
 
     def options(self, **more):
-        """How every process of the case is started."""
+        """The options with which every process of the case is started."""
         environment = {**os.environ, "LC_ALL": "C", "VX_CDB_FORCE_EMPTY_TIMESTAMP": ""}
         return {"cwd": self.directory, "env": environment, "stdin": subprocess.DEVNULL, **more}
 
     def start(self, *arguments, **more):
-        """The program, running, with pipes for its streams."""
+        """Starts the program, with pipes for its streams."""
         streams = {"stdout": subprocess.PIPE, "stderr": subprocess.PIPE, **more}
         return subprocess.Popen([self.program, *arguments], **self.options(**streams))
 
     def run(self, *arguments, **more):
-        """A whole run of the program; by default of the source into the output."""
+        """Runs the program to its end; by default it compiles the source to the output."""
         streams = {"stdout": subprocess.PIPE, "stderr": subprocess.PIPE, **more}
         command = [self.program, *(arguments or (SOURCE, OUT))]
         return subprocess.run(command, timeout=TIMEOUT, **self.options(**streams))
 
     def inspect(self, *arguments, **more):
-        """A run of cdef."""
+        """Runs cdef."""
         streams = {"stdout": subprocess.PIPE, "stderr": subprocess.PIPE, **more}
         return subprocess.run([self.cdef, *arguments], timeout=TIMEOUT, **self.options(**streams))
 
     def verified(self, name=OUT):
-        """A database in which cdef finds no error."""
+        """Checks that cdef finds no error in a database."""
         expect(self.inspect("verify", "-q", name), 0)
 
     @contextlib.contextmanager
     def left_alone(self, name=OUT):
-        """Whatever runs meanwhile, a file stays what it is, to the inode and the time."""
+        """Checks that a file does not change while the block runs, not even its inode and time."""
 
         def identity():
             status = os.stat(self.path(name))
@@ -122,7 +122,7 @@ class World:
         check(identity() == before, name, "was touched")
 
     def good(self, source=None, *options):
-        """The database of a source, made without any fault."""
+        """The database of a source, compiled without any fault."""
         if source is not None:
             self.write(SOURCE, source)
         result = self.run(*options, SOURCE, "good.cdef")
@@ -131,14 +131,14 @@ class World:
 
 
 def expect(result, status, stderr=b"", stdout=b""):
-    """Status and streams of a run, exactly."""
+    """Checks the status and the streams of a run exactly."""
     __tracebackhide__ = True
     actual = (result.returncode, result.stderr, result.stdout)
     compare.same(actual, (status, stderr, stdout), "status, standard error, standard output")
 
 
 def as_nobody():
-    """In the child: another user, if this one is root."""
+    """For the child process: another user, if this one is root."""
     if os.geteuid() == 0:
         os.setgroups([])
         os.setgid(NOBODY)
@@ -146,10 +146,10 @@ def as_nobody():
 
 
 def limit(what, value):
-    """In the child: a limit; for preexec_fn."""
+    """For the child process: a limit; for preexec_fn."""
     return lambda: resource.setrlimit(what, (value, value))
 
 
 def only_zeros(world):
-    """A file that could not be filled contains only zeros, not half a database."""
+    """Whether a file that could not be filled contains only zeros, not half a database."""
     check(not world.read().strip(b"\0"), "the file is not empty of data")

@@ -131,7 +131,7 @@ class NotationError(Exception):
 
 
 def mark(order):
-    """The struct prefix of a byte order."""
+    """The prefix for struct of a byte order."""
     return {"little": "<", "big": ">"}[order]
 
 
@@ -151,24 +151,24 @@ def type_code(name):
 
 
 def element_type(name):
-    """The type that a cell of an array's element has, else the type itself."""
+    """The element type of an array type; any other type unchanged."""
     return name[:-5] if name.endswith("Array") else name
 
 
 def pad8(data):
-    """Data with zero bytes up to a multiple of eight."""
+    """Data followed by zero bytes up to a multiple of eight."""
     return data + bytes(-len(data) % 8)
 
 
 def cell_width(name):
-    """How many bytes of a cell of this type a reversal turns."""
+    """The number of bytes of a cell of this type that a reversal reverses."""
     if name in ("UNKNOWN", "None", "SBS"):
         return 0
     return 8 if name in ("Int64", "UInt64", "Float64") else 4
 
 
 def cell(text, order, native):
-    """An eight-byte value cell: written in native order, then turned by type."""
+    """An eight-byte value cell: written in native order, then reversed according to its type."""
     if text == "none":
         return struct.pack("<II", NONE, 0)
     if text == "ones":
@@ -195,7 +195,7 @@ def cell(text, order, native):
 
 
 class Image:
-    """The image under construction: bytes, their labels, the section starts."""
+    """The image under construction: its bytes, their labels, and the starts of its sections."""
 
     def __init__(self, order, native):
         self.order = order
@@ -206,7 +206,7 @@ class Image:
         self.max_ids = {"rm_id": 0, "rc_class_id": 0}
 
     def put(self, data, label):
-        """Append bytes under a name that a failure report can show."""
+        """Appends bytes with a label for the report of a failure."""
         self.labels.append((len(self.body), len(data), label))
         self.body += data
 
@@ -333,7 +333,7 @@ def fields_of(tokens, groups):
 
 
 def put_line(image, line, groups):
-    """Append what one line of the description says."""
+    """Appends what one line of the description means."""
     still = line.startswith("still ")
     if still:
         line = line[len("still "):].strip()
@@ -391,12 +391,12 @@ def assemble(text, order="little", native="little", base_dir="."):
 
 
 def raw_hex(text):
-    """A whole file stated as hexadecimal bytes, with comments."""
+    """A whole file, given as hexadecimal bytes with comments."""
     return bytes.fromhex(" ".join(line.split("//", 1)[0] for line in text.splitlines()))
 
 
 def hex_lines(data):
-    """Sixteen bytes a line, as the failure report shows them."""
+    """Lines of sixteen bytes, as the report of a failure shows them."""
     return [f"{at:06x}  {data[at:at + 16].hex(' ')}" for at in range(0, len(data), 16)]
 
 

@@ -31,7 +31,7 @@ ESCAPES = {"\t": "\\t", "\n": "\\n", "\r": "\\r", '"': '\\"', "\\": "\\\\"}
 
 
 def quoted(text):
-    """Text as listings quote it; bytes that are no UTF-8 come as {'bytes': hex}."""
+    """Text in the quotes of a listing; bytes that are not UTF-8 are given as {'bytes': hex}."""
     if isinstance(text, dict):
         text = bytes.fromhex(text["bytes"]).decode("utf-8", "surrogateescape")
     shown = ""
@@ -43,12 +43,12 @@ def quoted(text):
 
 
 def real(number):
-    """A float's digits, as C++ writes them."""
+    """The digits of a float, as C++ writes them."""
     return number if isinstance(number, str) else repr(number).removesuffix(".0")
 
 
 class Listing:
-    """Tells JSON as a listing, by docs/dump.md."""
+    """Converts JSON to a listing, following docs/dump.md."""
 
     def __init__(self):
         self.lines = []
@@ -107,7 +107,7 @@ class Listing:
         self.members(depth + 1, record, kind)
 
     def members(self, depth, record, kind=None):
-        """All members of a group. kind: the data type of values whose group does not tell it."""
+        """All members of a group. kind: the data type of its values, if the group does not contain it."""
         kind = record.get("ra_data_type", record.get("sd_field_type", kind))
         for key, value in record.items():
             if key in VALUES:

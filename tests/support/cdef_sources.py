@@ -43,7 +43,7 @@ class Writer:
         self.open_dynamic = None  # data type of the resource attribute that a class attribute's Range goes to
 
     def chance(self, probability):
-        """True with that probability."""
+        """True with this probability."""
         return self.random.random() < probability
 
     def some(self, choices):
@@ -68,11 +68,11 @@ class Writer:
         return self.random.choice((0, 1, 2, 77, 255, 65535))
 
     def identifier(self):
-        """A number that others may have too."""
+        """A number that may be used several times."""
         return self.random.choice((0, 1, 2, 3, 4, 5, 6, 32773, -1, 65536))
 
     def value(self, datatype):
-        """The text of a value of a type that has texts."""
+        """The text of a value of a type whose values have texts."""
         element = datatype.removesuffix("Array")
         if element in LIMITS:
             return self.random.choice((*LIMITS[element], str(self.random.randint(0, 1000))))
@@ -83,12 +83,12 @@ class Writer:
         return "0x" + self.random.randbytes(self.random.choice((0, 1, 7, 8, 9, 60))).hex()
 
     def varieties(self):
-        """One variety line or more."""
+        """One or more variety lines."""
         for _ in range(self.random.choice((1, 1, 1, 2, 3))):
             self.line("VarietyRange", f"{self.random.randint(0, 9)},{self.random.choice((9, 12, 4294967295))}")
 
     def required(self):
-        """What every attribute and action begins with."""
+        """The lines with which every attribute and action begins."""
         name = self.text()
         self.names.append(name)
         self.line("Name", name)
@@ -97,7 +97,7 @@ class Writer:
         self.line("Id", self.identifier())
 
     def valid_values(self, name, datatype):
-        """Valid values, of a type that has texts."""
+        """Valid values of a type whose values have texts."""
         for _ in range(self.random.choice((0, 0, 1, 2))):
             low = self.value(datatype)
             self.line(name, low if self.chance(0.5) or '"' in low else f"{low},{self.value(datatype).strip(chr(34))}")
@@ -172,7 +172,7 @@ class Writer:
             self.line("ReArmDescription", self.number16())
 
     def attribute_runs(self, datatype):
-        """Up to two runs of SD stanzas, of which the last one counts."""
+        """Up to two runs of SD stanzas, of which the last one is used."""
         if datatype not in STRUCTURED:
             return
         kinds = self.random.sample(("PAttrSDDefinition", "DAttrSDDefinition"), self.random.choice((0, 1, 1, 1, 2)))
@@ -239,7 +239,7 @@ class Writer:
     # -- the source --
 
     def begin_class(self):
-        """What every class begins with; the rest of its first stanza may be missing."""
+        """The first stanzas of every class; some lines of the first one may be missing."""
         self.names = []
         self.open_dynamic = None
         self.lines.append("ControlDefinition")
@@ -274,7 +274,7 @@ class Writer:
             self.run(f"{self.random.choice(INPUTS)}SDDefinition", ("None", "SBS", "Unheard"))
 
     def locator(self):
-        """A late ResourceClass stanza with a locator, which nothing may be called."""
+        """A later ResourceClass stanza with a Locator, which may name no attribute."""
         self.lines.append("ResourceClass")
         for name in ("Description", "DisplayName", "ClassPermTemplate", "ResourcePermTemplate"):
             self.line(name, 1)
@@ -302,5 +302,5 @@ class Writer:
 
 
 def source(seed):
-    """The source of a seed."""
+    """The source for a seed."""
     return Writer(seed).whole()

@@ -6,7 +6,7 @@ LINES = 60  # of a difference that are shown
 
 
 def lines_of(value):
-    """A value as lines, with everything visible that is not plain text."""
+    """A value as lines, with all unusual characters made visible."""
     if isinstance(value, bytes):
         value = value.decode("utf-8", "backslashreplace")
     if isinstance(value, str):
@@ -15,7 +15,7 @@ def lines_of(value):
 
 
 def difference(actual, expected):
-    """Where two values differ, as lines: '-' is expected, '+' is what there is; nothing if they are equal."""
+    """The lines in which two values differ: '-' is expected, '+' was found; empty if the values are equal."""
     if actual == expected:
         return []
     if isinstance(actual, tuple) and isinstance(expected, tuple) and len(actual) == len(expected):
@@ -29,7 +29,7 @@ def difference(actual, expected):
 
 
 def same(actual, expected, *what):
-    """Fail, showing the difference, unless two values are equal."""
+    """Fails and shows the difference unless two values are equal."""
     __tracebackhide__ = True  # pytest leaves this frame out
     if actual != expected:
         title = " ".join(map(str, what)) or "the result"
@@ -37,7 +37,7 @@ def same(actual, expected, *what):
 
 
 def none(problems):
-    """Fail with the problems, if there are any."""
+    """Fails and shows the problems if there are any."""
     __tracebackhide__ = True
     if problems:
         raise AssertionError("\n".join(map(str, problems)))

@@ -1,4 +1,4 @@
-"""What tests read out of the documents and the manual pages."""
+"""Reads the parts of documents and manual pages that tests need."""
 
 import pathlib
 import re
@@ -9,7 +9,7 @@ PAGES = sorted((PROJECT / "man").glob("*.[15]"))
 
 
 def plain(text):
-    """Roff as far as the pages use it, without its fonts and escapes."""
+    """The text of roff without fonts and escapes, as far as the pages use them."""
     for written, shown in ((r"\\f[BIR]", ""), (r"\\%", ""), (r"\\&", ""), (r"\\-", "-"), (r"\\\(aq", "'"),
                            (r"\\\(ga", "`"), (r"\\e", r"\\")):
         text = re.sub(written, shown, text)
@@ -33,19 +33,19 @@ def sources(path):
 
 
 def broken_links(path):
-    """What a document's links name that is not there."""
+    """The links of a document whose targets do not exist."""
     targets = re.findall(r"\]\(([^)#]+)[^)]*\)", path.read_text())
     return [target for target in targets if "://" not in target and not (path.parent / target).exists()]
 
 
 def chapters(path, depth):
-    """Each heading of a depth with what is below it, up to the next of the same depth or a higher one."""
+    """Each heading of a level with the text below it, up to the next heading of this or a higher level."""
     parts = re.split(rf"^(#{{2,{depth}}}) (.*)\n", path.read_text(), flags=re.M)[1:]
     return [(title, text) for marks, title, text in zip(*[iter(parts)] * 3) if len(marks) == depth]
 
 
 def tables(text):
-    """The tables in a text: rows of cells, the first of them the headings."""
+    """The tables in a text: lists of rows of cells, the headings first."""
     found = []
     for block in re.findall(r"(?:^\|.*\n)+", text, re.M):
         rows = [[cell.strip() for cell in re.split(r"(?<!\\)\|", line.strip()[1:-1])] for line in block.splitlines()]
@@ -54,5 +54,5 @@ def tables(text):
 
 
 def spans(text):
-    """Code spans; the marks of an example are none."""
+    """Code spans outside of examples."""
     return re.findall(r"(?<!`)`([^`\n]+)`(?!`)", text)

@@ -18,11 +18,11 @@ NO_NEWLINE = "-no-newline"
 
 
 class Error(ValueError):
-    """A file that does not follow the notation."""
+    """A file does not follow the notation."""
 
 
 class Expectation:
-    """What one file says: entries of keys and blocks, in their order."""
+    """The entries of one file, keys and blocks, in their order."""
 
     def __init__(self, path, keys=(), blocks=(), images=()):
         self.path = path
@@ -60,12 +60,12 @@ class Expectation:
         return "\n".join(value) + ("\n" if ends and value else "")
 
     def all(self, *names):
-        """The entries of these names, in their order, without the mark of a missing newline."""
+        """The entries with these names, in their order, without the mark of a missing newline."""
         found = [(name.removesuffix(NO_NEWLINE), text) for name, text in self.entries]
         return [(name, text) for name, text in found if name in names]
 
     def get(self, name, default=""):
-        """The one entry of a name; more than one is an error."""
+        """The entry with this name, of which there may be only one."""
         found = self.all(name)
         if len(found) > 1:
             raise Error(f"{self.path}: {name} comes twice")

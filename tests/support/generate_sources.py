@@ -59,7 +59,7 @@ LINE = 253
 
 @dataclasses.dataclass
 class Truth:
-    """What a database must say of its source."""
+    """The expected contents of a source's database."""
 
     name: bytes = None  # None: the output file's
     version: int = 0
@@ -82,15 +82,15 @@ class Writer:
     # -- choices --
 
     def chance(self, probability):
-        """True with that probability."""
+        """True with this probability."""
         return self.random.random() < probability
 
     def some(self, choices):
-        """One or more of several, with commas between."""
+        """One or more of several words, separated by commas."""
         return ",".join(self.random.sample(choices, self.random.randint(1, len(choices))))
 
     def characters(self, alphabet, least, most):
-        """A text of that alphabet."""
+        """A text of characters from that alphabet."""
         return "".join(self.random.choices(alphabet, k=self.random.randint(least, most)))
 
     def text(self):
@@ -108,7 +108,7 @@ class Writer:
     # -- lines --
 
     def raw(self, text):
-        """A line, and sometimes a comment or an empty one before it."""
+        """A line, sometimes with a comment or an empty line before it."""
         if self.chance(0.04):
             self.lines.append(self.random.choice(("", "# comment", "\t// comment", "  /* comment */", ' "" \t', "#")))
         self.lines.append(text)
@@ -118,7 +118,7 @@ class Writer:
         self.raw(kind + self.random.choice(("", "", "", " ", "\t# comment", " // comment")))
 
     def attribute(self, name, value, quotable=True):
-        """An attribute line. With quotes the value is the same."""
+        """An attribute line, sometimes with quotes, which do not change the value."""
         indent = self.random.choice(("\t", "\t", " ", "    ", " \t "))
         comment = self.random.choice((" # comment", "\t// comment", " /* comment")) if self.chance(0.05) else ""
         if quotable and self.chance(0.1):
@@ -129,20 +129,20 @@ class Writer:
         self.raw(line if len(line) + len(comment) > LINE else line + comment)
 
     def text_attribute(self, name, text=None):
-        """One with a text; returns the text."""
+        """An attribute line with a text; returns the text."""
         text = self.text() if text is None else text
         self.attribute(name, text)
         return text.encode("latin-1")
 
     def shuffled(self, *writers):
-        """Calls them in any order."""
+        """Calls functions in any order."""
         writers = list(writers)
         self.random.shuffle(writers)
         for writer in writers:
             writer()
 
     def required(self, kind, record, *more):
-        """The attributes that all records of a class have, and what others a kind needs, in any order."""
+        """The attributes that all records of a class require, and those that the kind requires, in any order."""
 
         def name():
             record["name"] = self.text_attribute("Name")
@@ -164,7 +164,7 @@ class Writer:
     # -- values --
 
     def value(self, data_type, separable=False):
-        """The text of a value of a type, or of an array's element; separable: without a comma of its own."""
+        """The text of a value of a type, or of an array's element. separable: the text must not contain a comma."""
         element = data_type.removesuffix("Array")
         if element in INTEGERS:
             low, high = INTEGERS[element]
@@ -187,7 +187,7 @@ class Writer:
                 self.attribute("ValueDisplayName", self.number16())
 
     def optional(self, *writers):
-        """Some of them, in any order, varieties between them."""
+        """Some of these lines, in any order, with varieties between them."""
         self.shuffled(*(writer for writer in (*writers, self.variety) if self.chance(0.4)))
 
     def number_of(self, name):
@@ -206,7 +206,7 @@ class Writer:
         return line
 
     def of_any_attribute(self):
-        """What both kinds of attributes may have besides values."""
+        """The optional lines of both kinds of attributes, except for values."""
         return [
             self.number_of("GroupID"),
             self.number_of("GroupName"),
@@ -228,7 +228,7 @@ class Writer:
         self.structure("PAttrSDDefinition", name)
 
     def defaults(self, data_type):
-        """Default values: elements of an array, or one of which the last counts."""
+        """Default values: the elements of an array, or one or more values of which the last one is used."""
         for _ in range(self.random.choice((1, 1, 3))):
             self.attribute("DefaultValue", self.value(data_type))
 
@@ -256,14 +256,14 @@ class Writer:
         self.structure("DAttrSDDefinition", name)
 
     def range(self, data_type):
-        """A range; ignored for types that are not numbers."""
+        """A range, which is ignored for types that are not numbers."""
         numeric = data_type.removesuffix("Array") in (*INTEGERS, "Float32", "Float64")
         self.attribute("Range", ",".join(self.value(data_type) if numeric else str(i) for i in (1, 2)))
 
     # -- structured data --
 
     def run(self, kind, bare=False, types=ELEMENT_TYPES):
-        """A run of elements; bare: without optional attributes."""
+        """A run of elements. bare: without optional attributes."""
         for index in range(self.random.choice((1, 1, 2, 4))):
             name = self.random.choice(types)
             self.header(kind)
@@ -394,7 +394,7 @@ NASTY = (
 
 
 def other_value(chooser, line):
-    """An attribute line with a value that suits nothing, or another line's kind of value."""
+    """An attribute line with a value that no attribute accepts, or with another line's form of value."""
     name, equals, _ = line.partition(b"=")
     return name + equals + chooser.choice(NASTY)
 
@@ -416,7 +416,7 @@ def other_type(chooser, line):
 
 
 def no_line(_chooser, _line):
-    """Nothing."""
+    """Removes the line."""
     return None
 
 
@@ -424,7 +424,7 @@ LINE_CHANGES = (other_value, other_value, changed_byte, other_stanza, other_type
 
 
 def change_lines(chooser, lines):
-    """One change of the lines' order or number."""
+    """Makes one change of the number or the order of lines."""
     at, to = chooser.randrange(len(lines)), chooser.randrange(len(lines))
     what = chooser.randrange(4)
     if what == 0:

@@ -1,4 +1,5 @@
-"""A locale whose numbers have a comma for a point, for programs that must not care.
+"""A locale whose numbers have decimal commas, for programs that must not depend on the locale. The tests build it from
+the sources in Debian's package locales, because machines for tests usually have none.
 
 The tests build it themselves, from the sources in Debian's package locales:
 a machine for tests has none.
@@ -11,7 +12,7 @@ NAME = "de_DE.UTF-8"
 
 
 def environment(locales):
-    """The variables that choose it, of the directory that it was built in; they have been seen to take effect."""
+    """The variables that select the locale in the directory where it was built. Checks that they take effect."""
     chosen = {"LOCPATH": str(locales), "LC_ALL": NAME}
     result = subprocess.run(
         ["locale", "decimal_point"], env={**os.environ, **chosen}, capture_output=True, text=True, check=True, timeout=60

@@ -71,7 +71,7 @@ class Case:
 
 
 class Source(Case):
-    """A plain source, which has no expectation beside it."""
+    """A source without an expectation."""
 
     def __init__(self, path):
         self.expect, self.source = path, path.with_suffix(".cdefsrc")
@@ -79,7 +79,7 @@ class Source(Case):
 
 
 def set_up(case, directory):
-    """What the case needs besides the program: the source, and what its set-up says."""
+    """Prepares the directory of a case: the source, and the files of its key setup."""
     if case.source.exists():
         (directory / case.source.name).write_bytes(case.source.read_bytes())
     for action, *names in case.setup:
@@ -130,7 +130,7 @@ def compare_stream(name, expected, actual):
 
 
 def compare_stderr(case, actual):
-    """The difference of the error stream, or of its form when the text is free."""
+    """The difference of the error stream. If the text is free, only its form is compared."""
     if case.keys.get("message") == "free":
         good = actual.endswith(b"\n") and actual.count(b"\n") == 1 and len(actual) > 1
         return [] if good else [f"stderr is not one line: {actual!r}"]
@@ -157,7 +157,7 @@ def compare_image(expected, labels, actual):
 
 
 def compare_files(case, before, after):
-    """What a run may leave behind: one new file, or on failure nothing."""
+    """Checks the files after a run: one new file, or on failure none."""
     after = dict(after)
     before = dict(before)
     if case.status == 0:
@@ -171,7 +171,7 @@ def compare_files(case, before, after):
 
 
 def check_run(case, program, extra, order, native):
-    """One run of a case against its expectation; problems and the file."""
+    """Compares one run of a case with its expectation. Returns the problems and the file."""
     result, before, after = run(case, program, extra)
     problems = []
     if result.returncode != case.status:
@@ -187,7 +187,7 @@ def check_run(case, program, extra, order, native):
 
 
 def check_case(case, program, native):
-    """Every run that a case needs, with -s too if it compiles; the problems."""
+    """Runs a case, also with -s if it compiles. Returns the problems."""
     problems, written = check_run(case, program, [], native, native)
     if case.status == 0 and written is not None:
         more, reversed_file = check_run(case, program, ["-s"], cdb_image.other(native), native)
@@ -199,7 +199,7 @@ def check_case(case, program, native):
 
 
 def check_notation(case):
-    """Assemble a case's image in every order, and reverse what it gives."""
+    """Assembles a case's image in every order, and reverses each."""
     problems = []
     if bool(case.images) and case.status != 0:
         problems.append("an image for a run that fails")

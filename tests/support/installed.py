@@ -1,4 +1,4 @@
-"""What the tests of the installed tree share: the tree, a directory of their own, and running programs."""
+"""Shared by the tests of the installed tree: the tree, a directory for each test, and running programs."""
 
 import os
 import pathlib
@@ -18,7 +18,7 @@ _installed = None
 
 
 def run(*command, **options):
-    """Text of standard output; a failure is one of the test, with all that the program said."""
+    """The standard output of a program. If it fails, the test fails and shows all its output."""
     done = subprocess.run([str(word) for word in command], text=True, stdout=subprocess.PIPE, stderr=subprocess.STDOUT,
                           timeout=TIMEOUT, **options)
     if done.returncode != 0:
@@ -27,7 +27,8 @@ def run(*command, **options):
 
 
 def tree():
-    """The root of a tree that was installed elsewhere and then moved: whatever holds the prefix does not work there."""
+    """The root of a tree that was installed elsewhere and then moved: a file that contains the prefix would not work.
+    """
     global _installed
     if _installed is None:
         _installed = tempfile.TemporaryDirectory(prefix="cdgen-install-")
@@ -38,7 +39,7 @@ def tree():
 
 
 def only(pattern):
-    """The one path in the tree that the pattern finds."""
+    """The only path in the tree that matches the pattern."""
     found = sorted(tree().glob(pattern))
     if len(found) != 1:
         raise AssertionError(f"{pattern}: found {found}")
@@ -46,7 +47,7 @@ def only(pattern):
 
 
 def documents():
-    """Where the documents and the examples are."""
+    """The directory of the documents and the examples."""
     return tree() / "share/doc/cdgen"
 
 
@@ -59,18 +60,18 @@ def program(name):
 
 
 def pkg_config_environment():
-    """Finds the tree's cdgen.pc, and no other."""
+    """An environment in which pkg-config finds only the tree's cdgen.pc."""
     return {**os.environ, "PKG_CONFIG_LIBDIR": str(only("lib*/**/cdgen.pc").parent)}
 
 
 def later(path):
-    """Makes a file newer than whatever was built."""
+    """Makes a file newer than everything that has been built."""
     soon = time.time() + 5
     os.utime(path, (soon, soon))
 
 
 class Case(unittest.TestCase):
-    """Has an empty directory, self.here."""
+    """A test with an empty directory, self.here."""
 
     def setUp(self):
         directory = tempfile.TemporaryDirectory(prefix="cdgen test ")

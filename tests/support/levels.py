@@ -1,5 +1,5 @@
-"""The rules of `cdef diff --compat` and `cdef gate`: each with a change of tests/cdef/diff/base.cdefsrc that breaks it, and
-a similar one that does not."""
+"""The rules of `cdef diff --compat` and `cdef gate`: for each, a change of tests/cdef/diff/base.cdefsrc that breaks it,
+and a similar one that does not."""
 
 LEVELS = ("readers", "clients", "stored")
 SERIAL = "PersistentResourceAttribute 'Serial'"
@@ -11,7 +11,7 @@ DYNAMIC = NEW.replace("PersistentResource", "DynamicResource") + "\tVariableType
 
 
 def added(stanza, lines=""):
-    """A new stanza in front of the action's."""
+    """A new stanza in front of the action."""
     return [(BEFORE_ACTION, stanza + lines + BEFORE_ACTION)]
 
 

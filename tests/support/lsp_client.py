@@ -1,4 +1,4 @@
-"""A small client of `cdef lsp`, written from the protocol alone: it shares nothing with the server."""
+"""A small client of `cdef lsp`, written from the protocol alone. It shares no code with the server."""
 
 import json
 import os
@@ -26,7 +26,7 @@ CAPABILITIES = {
 
 
 def frame(message):
-    """A message with its header; bytes are taken for a body as they are."""
+    """A message with its header. Bytes are used as the body unchanged."""
     body = message if isinstance(message, bytes) else json.dumps(message, ensure_ascii=False).encode()
     return b"Content-Length: %d\r\n\r\n" % len(body) + body
 
@@ -43,14 +43,14 @@ def frames(data):
 
 
 def talk(data, *options):
-    """What the server answers to these bytes, and its status."""
+    """The server's answers to these bytes, and its status."""
     done = subprocess.run([PROGRAMS.cdef, "lsp", *options], input=data, capture_output=True, timeout=TIMEOUT,
                           check=False)
     return frames(done.stdout), done.returncode, done.stderr.decode()
 
 
 def uri_of(path):
-    """A file as a URI."""
+    """The URI of a file."""
     return "file://" + urllib.parse.quote(str(path))
 
 
@@ -63,7 +63,7 @@ class ServerError(Exception):
 
 
 class Client:
-    """A server with the client's side of the conversation."""
+    """A server, and the client's side of the conversation."""
 
     def __init__(self, *options, capabilities=None, root=None, initialize=True, **more):
         self.process = subprocess.Popen([PROGRAMS.cdef, "lsp", *options], stdin=subprocess.PIPE, stdout=subprocess.PIPE)
@@ -112,13 +112,13 @@ class Client:
         self.send({"jsonrpc": "2.0", "method": method, "params": params})
 
     def ask(self, method, **params):
-        """Send a request; its number."""
+        """Sends a request. Returns its number."""
         self.latest += 1
         self.send({"jsonrpc": "2.0", "id": self.latest, "method": method, "params": params})
         return self.latest
 
     def next(self):
-        """The next message, which is also taken note of."""
+        """The next message, which is recorded too."""
         message = self.arrived.get(timeout=TIMEOUT)
         assert message is not None, f"the server has ended, status {self.process.wait()}"
         if message.get("method") == "textDocument/publishDiagnostics":
@@ -158,33 +158,33 @@ class Client:
                     contentChanges=[{"text": each} if isinstance(each, str) else each for each in changes])
 
     def diagnostics(self, uri, version=1):
-        """The findings of a version of a document."""
+        """The findings for a version of a document."""
         while self.published.get(uri, {}).get("version") != version:
             self.next()
         return self.published[uri]["diagnostics"]
 
     def end(self):
-        """Shut the server down; its status."""
+        """Shuts the server down. Returns its status."""
         self.request("shutdown")
         self.notify("exit")
         return self.process.wait(timeout=TIMEOUT)
 
 
-# ---- Positions, counted anew -------------------------------------------------------------------------------------
+# ---- Positions, counted again ------------------------------------------------------------------------------------
 
 
 def lines_of(text):
-    """The lines of a text with what ends them; the last one may be empty."""
+    """The lines of a text with their ends; the last one may be empty."""
     return re.findall(r"[^\r\n]*(?:\r\n|\r|\n)", text) + [re.search(r"[^\r\n]*\Z", text).group()]
 
 
 def units(text, encoding="utf-16"):
-    """Code units of a text."""
+    """The number of code units of a text."""
     return len(text.encode("utf-16-le")) // 2 if encoding == "utf-16" else len(text.encode())
 
 
 def offset(text, position, encoding="utf-16"):
-    """Characters of the text before a position that is in it."""
+    """The number of characters of the text before a position in it."""
     lines = lines_of(text)
     before = "".join(lines[:position["line"]])
     line, character = lines[position["line"]].rstrip("\r\n"), 0
@@ -195,7 +195,7 @@ def offset(text, position, encoding="utf-16"):
 
 
 def part(text, place, encoding="utf-16"):
-    """The text in a range."""
+    """The text of a range."""
     return text[offset(text, place["start"], encoding):offset(text, place["end"], encoding)]
 
 
@@ -209,7 +209,7 @@ def position(text, at, encoding="utf-16"):
 
 
 def edited(text, edits, encoding="utf-16"):
-    """The text with edits made, all of which have places in the text before."""
+    """The text after edits whose places all refer to the text before."""
     def place(edit):
         return (offset(text, edit["range"]["start"], encoding), offset(text, edit["range"]["end"], encoding),
                 edit["newText"])

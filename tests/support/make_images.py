@@ -48,12 +48,12 @@ DOCUMENT_ROW = re.compile(r"\| (\d+) \| `([0-9a-f ]+)` \| ?(.*) \|")
 
 
 def numbers(width, texts, order):
-    """Numbers of a width in a byte order."""
+    """Numbers of a width, in a byte order."""
     return b"".join((int(text, 0) % (1 << 8 * width)).to_bytes(width, order) for text in texts)
 
 
 def put_line(image, line, groups):
-    """Append what one line of a description says."""
+    """Appends what one line of a description means."""
     word, _, rest = line.partition(" ")
     if word == "section" and rest.strip().isdigit():
         image.sections.append((int(rest), len(image.body)))
@@ -88,7 +88,7 @@ def document_rows():
 
 
 def document():
-    """The worked example, little-endian as it is printed."""
+    """The worked example, in little-endian order as it is printed."""
     data = bytearray()
     for at, content, _ in document_rows():
         assert at == len(data), at
@@ -97,7 +97,7 @@ def document():
 
 
 def document_regions():
-    """Offset, size and content of each thing in the worked example; one that takes two rows is joined."""
+    """Offset, size and content of each region in the worked example. Two rows of one region are joined."""
     regions = []
     for at, content, text in document_rows():
         if text:
@@ -108,7 +108,7 @@ def document_regions():
 
 
 def change(data, key, value, order):
-    """The image with one line of a broken image's description done to it."""
+    """Makes the change of one line of a broken image's description."""
     if key == "put":
         width, at, number = value.split()
         at = int(at)
@@ -128,7 +128,7 @@ def change(data, key, value, order):
 
 
 def settle(data, order, kept):
-    """Put in length and checksum, but for the one that is kept."""
+    """Corrects length and checksum, except for the one that is to be kept."""
     prefix = cdb_image.mark(order)
     if "length" not in kept and len(data) >= 4:
         struct.pack_into(prefix + "I", data, 0, len(data) - 4)

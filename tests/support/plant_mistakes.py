@@ -50,12 +50,12 @@ class Stanza:
 
     @property
     def is_element(self):
-        """Whether it describes an element of structured data."""
+        """Whether the stanza is an element of structured data."""
         return self.kind.endswith("SDDefinition")
 
     @property
     def required(self):
-        """The names of its required attributes."""
+        """The names of the stanza's required attributes."""
         return ELEMENT if self.is_element else REQUIRED[self.kind]
 
 
@@ -75,7 +75,7 @@ def stanzas_of(lines):
 
 
 def parts(line):
-    """Blanks, name, value and comment of an attribute line without quotes; None for another line."""
+    """Blanks, name, value and comment of an attribute line without quotes; None for any other line."""
     match = re.fullmatch(r'([ \t]+)(\w+)=([^"#]*?)((?:[ \t]+(?:#|//|/\*)[^"]*)?)', line)
     return match and match.groups()
 
@@ -113,13 +113,13 @@ class Planter:
         return self.chooser.choice(choices) if choices else None
 
     def replace(self, at, name=None, value=None):
-        """Changes an attribute line; None unless that makes a difference."""
+        """Changes an attribute line. Returns None if that makes no difference."""
         blanks, old_name, old_value, comment = parts(self.lines[at])
         line = f"{blanks}{old_name if name is None else name}={old_value if value is None else value}{comment}"
         return self.put(at, line)
 
     def put(self, at, line):
-        """Changes a line; None unless that makes a difference."""
+        """Changes a line. Returns None if that makes no difference."""
         if line == self.lines[at]:
             return None
         self.lines[at] = line
@@ -130,7 +130,7 @@ class Planter:
         del self.lines[at]
 
     def move(self, at, to):
-        """Moves a line to a place in front of it."""
+        """Moves a line up to another place."""
         self.lines.insert(to, self.lines.pop(at))
 
     def move_down(self, at, to):
@@ -143,7 +143,7 @@ class Planter:
         return chosen and self.replace(chosen[1], value=value)
 
     def wrong_word(self, names):
-        """Misspells the value of an attribute; of a list, one of its words."""
+        """Misspells the value of an attribute; if it is a list, one of its words."""
         chosen = self.choose(self.lines_with(*names))
         if chosen is None:
             return None
@@ -153,7 +153,7 @@ class Planter:
         return self.replace(chosen[1], value=",".join(words))
 
     def numeric_type(self, one):
-        """Whether values of a stanza are numbers."""
+        """Whether the values of a stanza are numbers."""
         found = [parts(self.lines[at]) for at in one.positions("DataType")]
         return bool(found and found[0] and NUMERIC.fullmatch(found[0][2]))
 
@@ -262,7 +262,7 @@ class Planter:
         return found and self.replace(at, value="Int32") and [at, *range(first.header, first.end)]
 
     def second_map(self):
-        """There is a second map."""
+        """There is a second ClassToManagerMapping."""
         chosen = [one for one in self.stanzas if one.kind == "ClassToManagerMapping"][0]
         at = self.chooser.choice(self.stanzas[self.stanzas.index(chosen):]).end
         self.lines[at:at] = [line for line in self.lines[chosen.header:chosen.end]]
@@ -305,7 +305,7 @@ class Planter:
         return list(range(one.header, two.end))
 
     def line_in_previous_stanza(self):
-        """A required line is at the end of the stanza before, which is of the same kind."""
+        """A required line is at the end of the previous stanza of the same kind."""
         pair = self.choose([pair for pair in zip(self.stanzas, self.stanzas[1:])
                             if pair[0].kind == pair[1].kind and pair[0].kind in REQUIRED])
         if pair is None:
@@ -316,13 +316,13 @@ class Planter:
         return list(range(one.header, two.end))
 
     def stray_words(self):
-        """A line of words that belongs into a comment."""
+        """A line of words that should be a comment."""
         at = self.chooser.choice(self.stanzas).header + self.chooser.randrange(2)
         self.lines.insert(at, self.chooser.choice(("see below", "\tsee below", "  TODO", "----")))
         return [at]
 
     def joined_lines(self):
-        """Two lines of a stanza are one."""
+        """Two lines of a stanza are joined to one."""
         pair = self.choose([(one.header, one.attributes[0][0]) for one in self.stanzas if one.attributes])
         if "#" in self.lines[pair[0]] or "//" in self.lines[pair[0]]:
             return None
@@ -351,19 +351,19 @@ class Planter:
         return chosen and self.replace(chosen[1], name=parts(self.lines[chosen[1]])[1] + " ")
 
     def open_quote(self):
-        """A value has a quote in front only."""
+        """A value has a quote only at its beginning."""
         chosen = self.choose([(one, at) for one, at in self.lines_with() if not parts(self.lines[at])[3]])
         return chosen and self.replace(chosen[1], value='"' + parts(self.lines[chosen[1]])[2])
 
     def junk_after_header(self):
-        """More than a header is in its line."""
+        """The line of a header contains something else too."""
         one = self.choose(self.stanzas)
         return self.put(one.header, one.kind + self.chooser.choice((":", "=", " {", " x", ";")))
 
     # -- values --
 
     def text_for_number(self):
-        """A text where a number belongs."""
+        """There is a text in the place of a number."""
         return self.new_value(NUMBERS, self.chooser.choice(("none", "x", "one")))
 
     def letter_in_number(self):
@@ -377,12 +377,12 @@ class Planter:
                               str(self.chooser.randint(65536, 10**6)))
 
     def text_for_typed(self):
-        """A text as a value of an attribute of numbers."""
+        """There is a text in the place of a number of the attribute's data type."""
         chosen = self.choose([(one, at) for one, at in self.lines_with(*TYPED) if self.numeric_type(one)])
         return chosen and self.replace(chosen[1], value="12x")
 
     def one_bound(self):
-        """A range has one bound only."""
+        """A range has only one bound."""
         return self.new_value(("VarietyRange", "Range"), "1")
 
     def three_bounds(self):
@@ -462,7 +462,7 @@ class Planter:
         return [at]
 
     def invalid_default(self):
-        """A default is not the one valid value."""
+        """A default is not the only valid value."""
         fit = [(one, at) for one, at in self.lines_with("DefaultValue", "InitialValue") if self.numeric_type(one)
                and one.kind != "PersistentClassAttribute" and len(one.positions("DefaultValue")) < 2
                and not one.positions("ValidValue") + one.positions("ValidStateValue")
@@ -488,7 +488,7 @@ class Planter:
         return chosen and [chosen[1], *self.insert(chosen[1] + 1, self.lines[chosen[1]])]
 
     def same_in_both(self, attribute, change=str):
-        """A dynamic attribute has a value of a persistent one. The one that comes later may be reported."""
+        """A dynamic attribute has a value of a persistent one. The mistake may be reported at the later of the two."""
         level = self.chooser.choice(("Resource", "Class"))
         lines = self.lines_with(attribute)
         given = self.choose([at for one, at in lines if one.kind == f"Persistent{level}Attribute"])
@@ -503,7 +503,7 @@ class Planter:
         return self.same_in_both("Name")
 
     def name_in_other_case(self):
-        """A dynamic attribute has the name of a persistent one, but for case."""
+        """A dynamic attribute has the name of a persistent one, in another case."""
         letters = LETTERS + LETTERS.upper()
         return self.same_in_both("Name", lambda name: "".join(c.swapcase() if c in letters else c for c in name))
 
@@ -524,13 +524,13 @@ class Planter:
         return chosen and self.replace(chosen[1], value="(" + parts(self.lines[chosen[1]])[2])
 
     def class_bit(self):
-        """The Id of an attribute in a variable class has the bit of class attributes."""
+        """The Id of an attribute in a variable class has the bit that marks class attributes."""
         fit = [(one, at) for one, at in self.lines_with("Id") if one.kind.startswith("Dynamic") and one.positions("VariableClass")]
         chosen = self.choose(fit)
         return chosen and self.replace(chosen[1], value=str(32768 + self.chooser.randrange(32768)))
 
     def large_locator(self):
-        """The Id of the attribute that is the Locator has more than 16 bits."""
+        """The Id of the Locator's attribute has more than 16 bits."""
         names = [parts(self.lines[at])[2] for _, at in self.lines_with("Locator")]
         fit = [(one, at) for one, at in self.lines_with("Id") if one.kind == "PersistentResourceAttribute"
                and self.value_of(one, "Name") in names]

@@ -1,4 +1,4 @@
-"""What the build made and the tests use; conftest.py says which build."""
+"""The programs that tests use, from the build that conftest.py selects."""
 
 import os
 import pathlib
@@ -11,10 +11,10 @@ EXAMPLES = PROJECT / "examples"
 
 
 class Programs:
-    """The programs under test, what helps to test them, and how they were built."""
+    """The programs to be tested, the programs that help to test them, and how they were built."""
 
     def use(self, build, cdgen=None, native="little"):
-        """Take the programs from a build directory, or cdgen from another place if one is given."""
+        """Selects the programs of a build directory, and optionally cdgen from another place."""
         self.build = pathlib.Path(build).resolve()
         self.cdgen = pathlib.Path(cdgen).resolve() if cdgen else self.build / "cdgen"
         self.native = native  # the byte order of the machine that cdgen is for
@@ -31,7 +31,7 @@ class Programs:
 
     @property
     def sanitizers(self):
-        """Those of the build, as -fsanitize= takes them."""
+        """The sanitizers of the build, as -fsanitize= takes them."""
         return self.cache.get("CDGEN_SANITIZE", "")
 
     def is_on(self, option):
@@ -40,12 +40,12 @@ class Programs:
 
 
 def runner():
-    """The words in front of a program that another machine is needed for."""
+    """The words in front of a program that needs another machine, such as an emulator."""
     return shlex.split(os.environ.get("CDGEN_RUNNER", ""))
 
 
 def environment(**more):
-    """Variables of a run whose bytes and words have to be the same everywhere."""
+    """The environment of runs whose output must be the same everywhere."""
     return {**os.environ, "LC_ALL": "C", "VX_CDB_FORCE_EMPTY_TIMESTAMP": "", **more}
 
 

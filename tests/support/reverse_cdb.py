@@ -18,7 +18,7 @@ CLASS, MANAGER, MAP, VARCLASS, HASH = 5, 3, 6, 4, 7
 
 
 class Reverser:
-    """One reversal: the native bytes that are read, the copy that is turned."""
+    """One reversal: the native bytes, which are read, and the copy, which is reversed."""
 
     def __init__(self, image):
         self.native = image
@@ -29,11 +29,11 @@ class Reverser:
         self.depth_max = NESTING_MAX
 
     def get(self, at, width=4):
-        """A native number."""
+        """A number in native order."""
         return struct.unpack_from(self.mark + {2: "H", 4: "I"}[width], self.native, at)[0]
 
     def turn(self, width, *places):
-        """Reverse the bytes of each field of one width."""
+        """Reverses the bytes of fields of one width."""
         for at in places:
             self.out[at:at + width] = self.native[at:at + width][::-1]
 
@@ -72,7 +72,7 @@ class Reverser:
             self.turn(4, at)
 
     def out_of_line(self, offset, kind, strings):
-        """What a Binary, SD or array cell refers to; a Binary's bytes stay."""
+        """The target of a Binary, SD or array cell. The bytes of a Binary are not reversed."""
         header, entry = {9: (4, 0), 11: (8, 16)}.get(kind, (8, 8))
         found = self.target(strings, offset, header, entry, count_at=0)
         if not found:
@@ -94,7 +94,7 @@ class Reverser:
             self.turn(4, *range(at, at + 8 + 8 * count, 4))
 
     def valid(self, offset, kind, tables):
-        """A valid-values list, its bounds turned as the element type."""
+        """A list of valid values, whose bounds are reversed as the element type."""
         found = self.target(tables["vv"], offset, 8, 24)
         if found:
             at, count = found

@@ -1,4 +1,4 @@
-"""Python scripts of script/ as modules, for their tests."""
+"""Imports Python scripts of script/ as modules, for their tests."""
 
 import importlib.machinery
 import importlib.util
@@ -7,7 +7,7 @@ from programs import PROJECT
 
 
 def script(name):
-    """A script as a module; its main program is not run."""
+    """A script as a module, without running its main program."""
     loader = importlib.machinery.SourceFileLoader(name, str(PROJECT / "script" / name))
     module = importlib.util.module_from_spec(importlib.util.spec_from_loader(name, loader))
     loader.exec_module(module)

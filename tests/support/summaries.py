@@ -1,4 +1,4 @@
-"""The last line of `cdef check` as text, which counts what was found."""
+"""The last line of `cdef check` as text, which counts the findings."""
 
 import re
 
@@ -6,12 +6,12 @@ FINDING = re.compile(r"^(\S.*?):(?:\d+:){0,2} (error|warning): .* \[S\d+[^\]]*\]
 
 
 def counted(number, what):
-    """1 error, 2 errors."""
+    """"1 error", "2 errors"."""
     return f"{number} {what}{'' if number == 1 else 's'}"
 
 
 def with_summary(text, sources=1):
-    """A text of findings with its last line, if there are any."""
+    """A text of findings with its last line; unchanged if there are no findings."""
     found = FINDING.findall(text)
     if not found:
         return text

@@ -17,7 +17,7 @@ TRACE = "trace"
 
 
 def traced(world, calls, injections, file=OUT, source=SOURCE, **more):
-    """The program, started with what strace is to inject at the calls that name or use a file."""
+    """Starts the program under strace, which injects faults or signals at the calls that name or use a file."""
     tracer = shutil.which("strace")
     if tracer is None:
         pytest.skip("no strace(1) here")
@@ -35,8 +35,8 @@ def traced(world, calls, injections, file=OUT, source=SOURCE, **more):
 
 
 def struck(world, call, number, **more):
-    """The program, started to get a signal at the first such system call on a file; whoever runs the tests may ignore
-    it."""
+    """Starts the program so that it gets a signal at the first such system call on a file. The signal has its default
+    effect, even if the test runner ignores it."""
     disposition = more.pop("disposition", signal.SIG_DFL)
     change = None if number in (signal.SIGSTOP, signal.SIGKILL) else lambda: signal.signal(number, disposition)
     return traced(world, call, [f"{call}:signal={int(number)}:when=1"], preexec_fn=change, **more)
@@ -49,7 +49,7 @@ def ended(process):
 
 
 def ended_by(process, number):
-    """Ended by the signal itself, in silence."""
+    """Checks that the signal itself ended the program, without output."""
     actual = ended(process)
     check(actual == (-number, b"", b""), "expected", -number, "actual", actual)
 
@@ -61,7 +61,7 @@ def only_child(process):
 
 
 def wait_until_stopped(world, process):
-    """The traced program's number, once the tracer says that it has stopped."""
+    """The process number of the traced program, when the tracer reports that it has stopped."""
     while b"stopped by SIGSTOP" not in world.read(TRACE):
         check(process.poll() is None, "ended before it was stopped:", process.returncode)
         time.sleep(0.001)
@@ -69,12 +69,12 @@ def wait_until_stopped(world, process):
 
 
 def stopped(world, call, **more):
-    """The program, and its number, stopped just after the first such system call on the output."""
+    """The program and its process number, stopped just after the first such system call on the output."""
     process = struck(world, call, signal.SIGSTOP, **more)
     return process, wait_until_stopped(world, process)
 
 
 def continued(process, child):
-    """How the program ends if it is let on."""
+    """The status and output of the program after it is continued."""
     os.kill(child, signal.SIGCONT)
     return ended(process)

@@ -1,4 +1,4 @@
-"""What the programs understand, from themselves."""
+"""The options and values that the programs accept, as the programs themselves report them."""
 
 import os
 import re
@@ -9,7 +9,7 @@ from installed import program, run
 
 
 def options_of_cdgen():
-    """Those that it does not call invalid; it has no help."""
+    """The options that cdgen does not call invalid; it has no help."""
     found = set()
     for letter in string.ascii_letters + string.digits:
         said = subprocess.run([program("cdgen"), f"-{letter}"], stderr=subprocess.PIPE, text=True, check=False,
@@ -34,7 +34,7 @@ def warnings():
 
 
 def values(*words):
-    """The words that an option can have, of each option that lists them in a help text, or that names a warning."""
+    """For each option that takes certain words, or the name of a warning: these words."""
     text = help_of(*words)
     known = {option: set(found.split(",")) for option, found in re.findall(r"^  (-\S+) [A-Z]+:\{([^}]*)\}", text, re.M)}
     for option in re.findall(r"^  (--(?:no-)?warn) NAME", text, re.M):

@@ -12,7 +12,7 @@ SIGNS = (b"#", b"//", b"/*")
 
 
 def comment_at(line):
-    """Where the comment of a line begins, as the language has it; its length if there is none."""
+    """The position of a line's comment, by the rules of the language; the length of the line if there is none."""
     quoted, text = False, False
     for at in range(len(line)):
         if not text and line[at:at + 1] == b"#":
@@ -25,7 +25,7 @@ def comment_at(line):
 
 
 def is_plain(line):
-    """A line that is read in one piece."""
+    """Whether a line is read in one piece."""
     return len(line) <= LINE and b"\0" not in line
 
 
@@ -36,7 +36,7 @@ def comments(source):
 
 
 class Untidy:
-    """One source."""
+    """One source to be made untidy."""
 
     def __init__(self, seed):
         self.random = random.Random(seed)
@@ -97,7 +97,7 @@ class Untidy:
 
 
 def untidy(seed, source):
-    """The same source in another form; sometimes its last line has no newline."""
+    """The same source with another layout. Sometimes its last line has no newline."""
     made = Untidy(seed)
     text = b"\n".join(made.lines(source))
     return text.rstrip(b"\n") if made.random.random() < 0.3 else text

@@ -35,12 +35,12 @@ PIPE_OF_SANITIZERS = re.compile(r"\w+\(([3-9]|\d\d+)<pipe:")
 
 
 def full():
-    """Whether everything is to be tried as often as documents say."""
+    """Whether to make as many attempts as docs/testing.md states."""
     return (PROGRAMS.cases or 0) >= 20000
 
 
 def two_databases(world):
-    """The databases of the source now and of the one before it, which is in its place."""
+    """The database of the source, and the one of an older source, which is in the target's place."""
     old = world.good(HEAD + attributes(5))
     new = world.good(HEAD + attributes(40))
     world.write(OUT, old)
@@ -48,7 +48,7 @@ def two_databases(world):
 
 
 def tracer():
-    """strace, where processes may be traced."""
+    """The path of strace, if processes may be traced."""
     found = shutil.which("strace")
     if found is None:
         pytest.skip("no strace(1) here")
@@ -59,7 +59,7 @@ def tracer():
 
 
 def traced(world, options, *arguments, **more):
-    """A build under the tracer, started."""
+    """Starts a build under the tracer."""
     started = world.options(**more)
     started["env"]["ASAN_OPTIONS"] = "detect_leaks=0"
     command = [tracer(), "-qq", "-o", world.path("trace"), *options, world.cdef, *(arguments or BUILD)]
@@ -79,7 +79,7 @@ def ended(process):
 
 
 def calls_of(world, *arguments):
-    """All system calls of a good build of its own, each with its number among those of its name."""
+    """All system calls of an undisturbed build, each with its number among the calls of that name."""
     process = traced(world, ["-y"], *arguments)
     check(ended(process) == (0, b""), "a good build fails")
     excluded = (*NEVER_FAILS, *(OF_SANITIZERS if PROGRAMS.sanitizers else ()))
@@ -93,14 +93,14 @@ def calls_of(world, *arguments):
 
 
 def whole(world, old, new, *where):
-    """The target is one of the two databases, and nothing but the temporary file is beside it."""
+    """Checks that the target is one of the two databases, and that only the temporary file is beside it."""
     check(world.read() in (old, new), "half a database after", *where)
     others = {path.name for path in world.directory.iterdir()} - {OUT, SOURCE, "good.cdef", "cdgen", "trace", TEMPORARY}
     check(not others, "left behind after", *where, others)
 
 
 def recovers(world, new, *where):
-    """The next build makes the database and removes what was left."""
+    """Checks that the next build makes the database and removes the temporary file."""
     expect(world.inspect(*BUILD), 0)
     check(world.read() == new, "not made after", *where)
     check(not world.path(TEMPORARY).exists(), "left for ever after", *where)
@@ -109,7 +109,7 @@ def recovers(world, new, *where):
 @pytest.mark.slow(9)
 @pytest.mark.parametrize("options", [(), ("--sync",)])
 def test_fault_at_each_system_call(world, options):
-    """It fails with a status and a message, or does not mind. Nothing is left behind then."""
+    """The build either fails with a status and a message, or succeeds. It leaves no temporary file."""
     old, new = two_databases(world)
     build = (BUILD[0], *options, *BUILD[1:])
     for name, number in list(calls_of(world, *build)):
@@ -125,7 +125,7 @@ def test_fault_at_each_system_call(world, options):
 
 @pytest.mark.slow(6)
 def test_killed_at_each_system_call(world):
-    """Without a chance to clean up."""
+    """The build cannot clean up."""
     old, new = two_databases(world)
     for name, number in list(calls_of(world)):
         world.write(OUT, old)
@@ -137,7 +137,7 @@ def test_killed_at_each_system_call(world):
 
 @pytest.mark.slow(4)
 def test_killed_at_random(world):
-    """500 times in all if everything is tried."""
+    """500 times in a full run."""
     old, new = two_databases(world)
     rng = random.Random(17)
     for _ in range(500 if full() else 40):
@@ -151,7 +151,7 @@ def test_killed_at_random(world):
 
 
 def test_signals_wait_for_the_new_name(world):
-    """A signal that arrives while the temporary file is there ends the program once it has gone."""
+    """A signal that arrives while there is a temporary file ends the program only after that file is gone."""
     old, new = two_databases(world)
     for number in (signal.SIGHUP, signal.SIGINT, signal.SIGQUIT, signal.SIGTERM, signal.SIGUSR1, signal.SIGALRM):
         for call in ("write", "flock", "fchmod", "rename"):
@@ -173,7 +173,7 @@ def test_ignored_signals_stay_ignored(world):
 
 @pytest.mark.slow(3)
 def test_signals_end_many_builds_at_once_cleanly(world):
-    """Each database is the old or the new one, and no temporary file is left, however many threads were writing."""
+    """Each database is the old or the new one, and no temporary file is left, whatever the number of threads."""
     names = [f"{number}.cdefsrc" for number in range(60)]
     old, new = two_databases(world)
     text = world.read(SOURCE)
@@ -193,7 +193,7 @@ def test_signals_end_many_builds_at_once_cleanly(world):
 
 
 def test_file_size_limit(world):
-    """A file that may not grow is an error of the call."""
+    """Exceeding the limit is reported as an error."""
     old, new = two_databases(world)
     for size in (0, 1, len(new) - 1):
         result = world.inspect(*BUILD, preexec_fn=limit(resource.RLIMIT_FSIZE, size))
@@ -205,7 +205,7 @@ def test_file_size_limit(world):
 
 
 def test_file_system_full(world):
-    """The old database is byte-equal, and nothing is beside it."""
+    """The old database does not change, and no file is left beside it."""
     world.write(OUT, world.good())
     old = len(world.read())
     world.write(SOURCE, HEAD + attributes(500))
@@ -223,7 +223,7 @@ def test_file_system_full(world):
 
 
 def test_full_device(world):
-    """Standard output that takes nothing, and one that nobody reads."""
+    """Standard output that is full, and one that nobody reads."""
     with open("/dev/full", "wb") as device:
         expect(world.inspect("build", "-o", "-", SOURCE, stdout=device), 2,
                b"cdef: standard output: No space left on device\n", None)
@@ -249,7 +249,7 @@ while not os.path.exists("stop"):
 
 @pytest.mark.slow(6)
 def test_reader_that_maps_the_target_while_it_is_rebuilt(world):
-    """A thousand times if everything is tried: each snapshot is one of two databases, both of which verify."""
+    """A thousand times in a full run. Each snapshot is one of two databases, and both are sound."""
     old, _ = two_databases(world)
     world.write("old.cdef", old)
     world.verified("old.cdef")
@@ -267,7 +267,7 @@ def test_reader_that_maps_the_target_while_it_is_rebuilt(world):
 
 
 def stopped_build(world, call):
-    """A build that has stopped at such a call, and its number."""
+    """A build that has stopped at such a call, and its process number."""
     process = traced(world, at_temporary(world, call, "STOP"))
     while b"stopped by SIGSTOP" not in world.read("trace") if world.path("trace").exists() else True:
         check(process.poll() is None, "ended before it was stopped:", process.returncode)
@@ -276,7 +276,7 @@ def stopped_build(world, call):
 
 
 def test_second_build_waits_for_the_first(world):
-    """And both succeed; with the same source, the second one finds nothing to do."""
+    """Both succeed. If the source is the same, the second one changes nothing."""
     _, new = two_databases(world)
     for call in ("write", "fchmod", "rename"):
         world.path(OUT).unlink(missing_ok=True)
@@ -293,7 +293,7 @@ def test_second_build_waits_for_the_first(world):
 
 @pytest.mark.slow(3)
 def test_many_builds_of_one_target_at_once(world):
-    """They end with one whole database."""
+    """The result is one complete database."""
     databases = set()
     for number in range(6):
         databases.add(world.good(HEAD + attributes(number * 20)))
@@ -307,7 +307,7 @@ def test_many_builds_of_one_target_at_once(world):
 
 
 def test_nobody_else_sees_a_private_database_grow(world):
-    """Until its contents are whole, only its owner may read it."""
+    """Only its owner may read it until its contents are complete."""
     two_databases(world)
     os.chmod(world.path(OUT), 0o644)
     process, child = stopped_build(world, "write")

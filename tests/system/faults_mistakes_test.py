@@ -1,5 +1,4 @@
-"""Mistakes in a source or in the operands: they leave an output that was there before as it was.
-"""
+"""Test that mistakes in a source or in the operands leave an existing output unchanged."""
 
 import shlex
 
@@ -11,7 +10,7 @@ GOLDEN = TESTS / "golden"
 
 
 def refused_cases(area):
-    """The golden cases of an area whose run fails for another reason than its output; their source and output."""
+    """The golden cases of an area that fail for a reason other than their output, with source and output."""
     for path in golden.cases_below(GOLDEN / area):
         expected = golden.Case(path)
         operands = shlex.split(expected.keys.get("operands", f"{expected.source.name} {expected.out}"))
@@ -21,7 +20,7 @@ def refused_cases(area):
 
 
 def stays(world, out, status, *arguments):
-    """A run that ends so, with traces and without, leaves a database as it was, to the inode and the time."""
+    """Checks that a failing run, with traces and without, leaves a database unchanged, including inode and time."""
     world.path(out).parent.mkdir(parents=True, exist_ok=True)
     world.write(out, BEFORE)
     for more in ((), ("-d", "3")):
@@ -31,7 +30,7 @@ def stays(world, out, status, *arguments):
 
 
 def untouched(world, area):
-    """Every golden case of an area that fails leaves the output."""
+    """Checks that every failing golden case of an area leaves the output unchanged."""
     count = 0
     for expected, operands in refused_cases(area):
         golden.set_up(expected, world.directory)
@@ -61,7 +60,7 @@ def test_mistakes_of_stanzas_leave_the_output(world):
 
 
 def test_settled_mistakes_leave_the_output(world):
-    """Golden cases of what was settled."""
+    """Golden cases of the area settled."""
     untouched(world, "settled")
 
 
@@ -76,7 +75,7 @@ def test_mistakes_of_operands_leave_the_output(world):
 
 
 def test_mistakes_at_the_end_leave_the_output(world):
-    """Whatever the source has made by then: golden cases that compile, and one header more."""
+    """Golden cases that compile, with one more header at the end: everything before it has been compiled."""
     count = 0
     for path in golden.cases_below(GOLDEN / "image"):
         expected = golden.Case(path)

@@ -1,4 +1,4 @@
-"""Faults of the system: what the programs do when files fail them.
+"""Test what the programs do when files fail. Every test is a function below, named for what it shows.
 
 Every test is a function below, named for what it shows.  Whatever happens, the
 program ends with a status of its own, never by a signal; and a fault before
@@ -33,7 +33,7 @@ MOUNT_REFUSED = 77  # a status that the program never has
 
 
 def of_errno(number):
-    """The system's words, as LC_ALL=C has them."""
+    """The system's message for an error number, in the locale C."""
     return os.strerror(number).encode()
 
 
@@ -41,7 +41,7 @@ def of_errno(number):
 
 
 def cannot_open(world, source, number, **more):
-    """The source does not open: the system's words and number, and the output as it was."""
+    """Checks that the source cannot be opened: the message and number of the system, and an unchanged output."""
     world.write(OUT, BEFORE)
     message = os.fsencode(source) + b": cannot open because: " + of_errno(number) + b"\n"
     with world.left_alone():
@@ -77,7 +77,7 @@ def test_source_name_too_long(world):
 
 
 def test_source_is_a_socket(world):
-    """Nothing that can be opened."""
+    """A socket cannot be opened."""
     with socket.socket(socket.AF_UNIX) as listener:
         here = os.getcwd()
         os.chdir(world.directory)
@@ -87,20 +87,20 @@ def test_source_is_a_socket(world):
 
 
 def needs_no_descriptors(world):
-    """Skips what shared libraries, which have to be opened, keep from starting."""
+    """Skips the test if the program needs shared libraries, which have to be opened."""
     usage = world.run("-n", preexec_fn=limit(resource.RLIMIT_NOFILE, 3)).stderr
     if not usage.startswith(b"Usage: "):
         pytest.skip("the program needs descriptors to start: it is not static")
 
 
 def test_source_when_no_descriptor_is_free(world):
-    """The three standard streams are all that may be open."""
+    """Only the three standard streams may be open."""
     needs_no_descriptors(world)
     cannot_open(world, SOURCE, errno.EMFILE, preexec_fn=limit(resource.RLIMIT_NOFILE, 3))
 
 
 def test_source_when_only_a_standard_descriptor_is_free(world):
-    """A standard stream's place is not taken for the source."""
+    """The source does not take the place of a standard stream."""
     needs_no_descriptors(world)
     script = f"exec 0<&- 3>&1; ulimit -n 4; exec ./cdgen {SOURCE} {OUT}"
     result = subprocess.run(["sh", "-c", script], capture_output=True, timeout=TIMEOUT, **world.options())
@@ -115,7 +115,7 @@ def test_two_free_descriptors_are_enough(world):
 
 
 def test_source_cannot_be_read(world):
-    """It opens, but reading fails."""
+    """It can be opened, but reading fails."""
     world.write(OUT, BEFORE)
     message = b"/proc/self/mem: cannot read because: " + of_errno(errno.EIO) + b"\n"
     with world.left_alone():
@@ -134,7 +134,7 @@ def test_source_is_a_directory(world):
 
 
 def test_source_is_the_null_device(world):
-    """Nothing in it."""
+    """It is empty."""
     expect(world.run("/dev/null", OUT), 1, b"No classes defined\n")
 
 
@@ -150,13 +150,13 @@ def through_pipe(world, feed):
 
 
 def test_source_is_a_pipe_that_closes_at_once(world):
-    """Nothing comes."""
+    """It is empty."""
     expect(through_pipe(world, lambda descriptor, process: None), 1, b"No classes defined\n")
     check(not world.path(OUT).exists(), "there is an output")
 
 
 def test_source_is_a_pipe_that_closes_too_early(world):
-    """Half of it comes, up to the middle of a line."""
+    """Only half of the source arrives, up to the middle of a line."""
     half = HEAD[: HEAD.index(b"\tMessageCatalog") - 2]
     good = world.good(half)
     expect(through_pipe(world, lambda descriptor, process: os.write(descriptor, half)), 0)
@@ -164,7 +164,7 @@ def test_source_is_a_pipe_that_closes_too_early(world):
 
 
 def test_source_comes_byte_by_byte(world):
-    """Reads that return less than was asked for."""
+    """Each read returns less than was requested."""
     good = world.good()
 
     def feed(descriptor, _):
@@ -176,7 +176,7 @@ def test_source_comes_byte_by_byte(world):
 
 
 def test_source_vanishes_while_the_program_sleeps(world):
-    """Stopped and continued in the middle of a pipe that has lost its name."""
+    """The program is stopped and continued while it reads a pipe that has been removed."""
     good = world.good()
 
     def feed(descriptor, process):
@@ -208,7 +208,7 @@ def while_read(world, source, change):
 
 
 def test_source_deleted_while_read(world):
-    """A file lives on while it is open."""
+    """The file exists as long as it is open."""
     source = HEAD + attributes(5000)
     good = world.good(source)
     check(while_read(world, source, os.unlink) == (0, b""), "it does not compile")
@@ -216,7 +216,7 @@ def test_source_deleted_while_read(world):
 
 
 def test_source_grows_while_read(world):
-    """What comes in time belongs to the source."""
+    """Lines that are added in time belong to the source."""
     source = HEAD + attributes(5000)
     more = ATTRIBUTE % (9999, 9999, 9999)
     good = world.good(source + more)
@@ -230,7 +230,7 @@ def test_source_grows_while_read(world):
 
 
 def test_source_shortened_while_read(world):
-    """What is read of it decides; in the middle of an attribute it is refused."""
+    """Only the part that has been read counts. If it ends in the middle of an attribute, it is refused."""
     world.write(OUT, BEFORE)
     status, stderr = while_read(world, HEAD + attributes(5000), lambda path: os.truncate(path, 0))
     if status == 0:
@@ -242,7 +242,7 @@ def test_source_shortened_while_read(world):
 
 
 def test_source_shortened_to_whole_stanzas_while_read(world):
-    """What is left is all of it."""
+    """The remaining part is a complete source."""
     left = HEAD + attributes(2000)
     good = world.good(left)
     status, stderr = while_read(world, HEAD + attributes(5000), lambda path: os.truncate(path, len(left)))
@@ -252,7 +252,7 @@ def test_source_shortened_to_whole_stanzas_while_read(world):
 
 
 def test_database_unreadable(world):
-    """Nobody may read what cdef is to verify."""
+    """Nobody may read the database that cdef is to verify."""
     world.write(OUT, world.good())
     os.chmod(world.path(OUT), 0)
     world.cdef = shutil.copy(world.cdef, world.directory)  # where any user can reach it
@@ -286,7 +286,7 @@ def test_output_below_a_file(world):
 
 
 def test_output_name_empty(world):
-    """No name at all."""
+    """The name is empty."""
     cannot_create(world, "", errno.ENOENT)
 
 
@@ -322,27 +322,27 @@ def test_output_is_a_full_device(world):
 
 
 def cannot_map(world, out):
-    """The output has no contents that could be mapped."""
+    """Checks that an output is refused because it cannot be mapped."""
     result = world.run(SOURCE, out)
     check(result.returncode == 1 and result.stdout == b"", "status", result.returncode, result.stdout)
     check(re.fullmatch(rb"Cannot map CDB file: [^\n]+\n", result.stderr), result.stderr)
 
 
 def test_output_is_a_pipe(world):
-    """It must not wait for a reader; the pipe stays."""
+    """The program must not wait for a reader. The pipe is not removed."""
     os.mkfifo(world.path(OUT))
     cannot_map(world, OUT)
     check(stat.S_ISFIFO(os.stat(world.path(OUT)).st_mode), "the pipe is gone")
 
 
 def test_output_is_the_null_device(world):
-    """The device stays."""
+    """The device is not removed."""
     cannot_map(world, "/dev/null")
     check(stat.S_ISCHR(os.stat("/dev/null").st_mode), "the device is gone")
 
 
 def test_output_is_a_link(world):
-    """A symbolic link is followed, and stays."""
+    """A symbolic link is followed and not replaced."""
     good = world.good()
     world.write("target", BEFORE * 1000)
     world.path(OUT).symlink_to("target")
@@ -351,7 +351,7 @@ def test_output_is_a_link(world):
 
 
 def test_output_is_a_link_to_nothing(world):
-    """What it leads to is created."""
+    """The target of the link is created."""
     good = world.good()
     world.path(OUT).symlink_to("target")
     expect(world.run(), 0)
@@ -366,7 +366,8 @@ def test_output_is_a_link_to_the_source(world):
 
 
 def test_output_takes_the_traces(world):
-    """Traces in a database would damage it; without them, nothing is written to the streams."""
+    """Traces would damage the database, so they are refused. Without traces, the program writes nothing to the streams.
+    """
     for stream in ("stdout", "stderr"):
         world.write(OUT, BEFORE)
         with open(world.path(OUT), "ab") as file:
@@ -379,13 +380,13 @@ def test_output_takes_the_traces(world):
 
 
 def test_new_output_has_its_mode(world):
-    """Mode 0644 but for the umask."""
+    """0644, reduced by the umask."""
     expect(world.run(preexec_fn=lambda: os.umask(0o026)), 0)
     check(stat.S_IMODE(os.stat(world.path(OUT)).st_mode) == 0o640, oct(os.stat(world.path(OUT)).st_mode))
 
 
 def test_replaced_output_keeps_its_mode_and_links(world):
-    """It is written in place."""
+    """Because it is overwritten in place."""
     good = world.good()
     world.write(OUT, BEFORE)
     os.chmod(world.path(OUT), 0o600)
@@ -396,7 +397,7 @@ def test_replaced_output_keeps_its_mode_and_links(world):
 
 
 def test_file_size_limit(world):
-    """A file that may not grow: an error of the call, no signal; the least limit that is enough."""
+    """Exceeding the limit is reported as an error, not by a signal. The test finds the lowest limit that is enough."""
     good = world.good(HEAD + attributes(50))
     gross = -(-len(good) // BLOCK) * BLOCK
     check(gross > 4 * BLOCK, "the database is too small for the case")
@@ -408,7 +409,7 @@ def test_file_size_limit(world):
 
 
 def test_output_is_filled_with_whole_blocks(world):
-    """The file is filled to the least multiple of a block that holds the database, not a byte further."""
+    """The size is the smallest multiple of a block that holds the database."""
     good = world.good(HEAD + attributes(50))
     status, *_ = ended(traced(world, "write,writev", []))
     check(status == 0, "the program cannot be traced")
@@ -417,7 +418,7 @@ def test_output_is_filled_with_whole_blocks(world):
 
 
 def test_file_system_full(world):
-    """A file system of 16 KB and a database of more."""
+    """The file system has 16 KB, and the database is larger."""
     world.write(SOURCE, HEAD + attributes(500))
     world.path("small").mkdir()
     script = 'mount -t tmpfs -o size=16k none small || exit %d; "$@"; status=$?; tr -d "\\0" <small/out.cdef; exit $status' % MOUNT_REFUSED

@@ -1,4 +1,5 @@
-"""Limits: what is allowed up to a number, and what happens at the next one.
+"""Test limits: the highest number that is allowed, and what happens one beyond it. Every test is a function below, or a
+row of a table, named for the limit.
 
 Every test is a function below, or a row of a table, named for the limit.
 """
@@ -21,7 +22,7 @@ NONE = "none.cdef"  # what never comes to be
 ROWS = {}  # tests that tables give, by name
 
 class Image:
-    """As much of a database as the cases look at."""
+    """The parts of a database that the cases need."""
 
     def __init__(self, contents):
         self.contents = contents
@@ -32,15 +33,15 @@ class Image:
         return struct.unpack_from(MARK + form, self.contents, at)
 
     def of_type(self, kind):
-        """Where the sections of a type begin."""
+        """The starts of the sections of a type."""
         return [at for found, at, _ in self.sections if found == kind]
 
     def in_class(self, at, form):
-        """Numbers of the class record."""
+        """Numbers in the class record."""
         return self.get(self.of_type(CLASS)[0] + at, form)
 
     def in_table(self, field, at, form):
-        """Numbers of the table that a field of the class record leads to."""
+        """Numbers in the table that a field of the class record refers to."""
         return self.in_class(self.in_class(field, "I")[0] + at, form)
 
 
@@ -51,7 +52,7 @@ COUNTS = 168  # persistent and dynamic class attributes, the resource's, class a
 
 
 def compiled(world, source):
-    """The database of a source that has to compile without a word, and be sound in both byte orders."""
+    """The database of a source that must compile without output and be sound in both byte orders."""
     world.write(SOURCE, source)
     expect(world.run("-s", SOURCE, TURNED), 0)
     expect(world.run(), 0)
@@ -64,7 +65,8 @@ def compiled(world, source):
 
 
 def refused(world, source, message):
-    """The source is refused with the message; there is no output, and one that was there before stays."""
+    """Checks that the source is refused with the message, that no output is created, and that an existing one is
+    unchanged."""
     world.write(OUT, world.good(HEAD))
     world.write(SOURCE, source)
     with world.left_alone():
@@ -100,7 +102,7 @@ def records(kind, count):
 
 
 def most_records(kind):
-    """65,535 of a kind are counted."""
+    """65,535 records of a kind are allowed."""
 
     def function(world):
         expected = [0] * 6
@@ -128,7 +130,7 @@ ONE = b"PersistentResourceAttribute\n" + REQUIRED.encode() % 1 + b"\tDataType=%s
 
 
 def test_varieties_65537_in_a_list(world):
-    """Counted in 32 bits."""
+    """Their number has 32 bits."""
     lines = b"".join(b"\tVarietyRange=%d,%d\n" % (i, i) for i in range(2, COUNT_MAX + 3))
     image = compiled(world, HEAD + ONE % b"Int32" + lines)
     check(image.in_table(VARIETIES, 4, "3I") == (COUNT_MAX + 2, 1, 1), image.in_table(VARIETIES, 4, "3I"))
@@ -137,7 +139,7 @@ def test_varieties_65537_in_a_list(world):
 
 
 def test_valid_values_65537_in_a_list(world):
-    """Counted in 32 bits."""
+    """Their number has 32 bits."""
     lines = b"".join(b"\tValidValue=%d\n" % i for i in range(COUNT_MAX + 2))
     image = compiled(world, HEAD + ONE % b"UInt64" + lines)
     check(image.in_table(VALID_VALUES, 4, "I") == (COUNT_MAX + 2,), image.in_table(VALID_VALUES, 4, "I"))
@@ -146,7 +148,7 @@ def test_valid_values_65537_in_a_list(world):
 
 
 def test_elements_65537_in_an_array(world):
-    """Counted in 32 bits, of which the cell has the place."""
+    """Their number has 32 bits, in front of the elements."""
     lines = b"".join(b"\tDefaultValue=%d\n" % i for i in range(COUNT_MAX + 2))
     image = compiled(world, HEAD + ONE % b"UInt32Array" + lines)
     place = image.in_table(PATTRS, 24, "I")[0]
@@ -155,7 +157,7 @@ def test_elements_65537_in_an_array(world):
 
 
 def test_elements_65537_in_a_structure(world):
-    """Counted in 32 bits; of the highest index the attribute has the low 16."""
+    """Their number has 32 bits; the attribute has the low 16 bits of the highest index."""
     element = "PAttrSDDefinition\n\tElementName=e\n\tDescription=1\n\tDisplayName=2\n\tElementIndex=%d\n\tDataType=UInt32\n"
     run = "".join(element % i for i in range(COUNT_MAX + 2)).encode()
     image = compiled(world, HEAD + ONE % b"SD" + run + HEAD[HEAD.index(b"ResourceClass") : HEAD.index(b"ClassTo")])
@@ -190,19 +192,19 @@ def ids_of(image):
 
 
 def test_variable_classes_100_with_ids(world):
-    """As many as may have IDs, each its own."""
+    """The highest number of variable classes with IDs."""
     found = list(ids_of(compiled(world, groups(GROUPS_MAX, GROUPS_MAX))))
     check(found == [(i + 7,) for i in range(GROUPS_MAX)], found)
 
 
 def test_variable_classes_101_with_ids(world):
-    """One more is refused."""
+    """One more than allowed."""
     message = b"Too many variable classes with dynamic attributes (100 at most)\n"
     refused(world, groups(GROUPS_MAX + 1, GROUPS_MAX + 1), message)
 
 
 def test_variable_classes_1000_of_which_100_have_ids(world):
-    """The others do not count."""
+    """Variable classes without IDs are not limited."""
     found = list(ids_of(compiled(world, groups(1000, GROUPS_MAX))))
     check(found == [(i + 7,) for i in range(GROUPS_MAX)] + [()] * 900, found)
 
@@ -291,43 +293,43 @@ for a_row in NUMBERS:
 
 
 def with_name(length, after=b""):
-    """A source with a line of so many characters that names an attribute, and the name."""
+    """A source with a line of so many characters that names an attribute, and that name."""
     name = b"N" * (length - len("\tName="))
     return HEAD + ONE.replace(b"Name=n", b"Name=" + name + after) % b"Int32", name
 
 
 def stored_name(image):
-    """The first attribute's name."""
+    """The name of the first attribute."""
     at = image.of_type(CLASS)[0] + image.in_class(STRINGS, "I")[0] + image.in_table(PATTRS, 8, "I")[0]
     return image.contents[at : image.contents.index(b"\0", at)]
 
 
 def test_line_of_253_characters(world):
-    """It is whole, and counts as one."""
+    """It is read in one piece."""
     source, name = with_name(LINE)
     check(stored_name(compiled(world, source)) == name, "another name")
     refused(world, source + b"X\n", b"%d: Invalid table name: X\n" % (source.count(b"\n") + 1))
 
 
 def test_line_of_254_characters(world):
-    """Its newline is a line of its own."""
+    """Its newline is read as a line of its own."""
     source, name = with_name(LINE + 1)
     check(stored_name(compiled(world, source)) == name, "another name")
     refused(world, source + b"X\n", b"%d: Invalid table name: X\n" % (source.count(b"\n") + 2))
 
 
 def test_line_of_255_characters(world):
-    """Its last character is a header."""
+    """Its last character is read as a header."""
     refused(world, with_name(LINE + 2)[0], b"18: Invalid table name: N\n")
 
 
 def test_line_of_256_characters(world):
-    """Its last two characters are a header."""
+    """Its last two characters are read as a header."""
     refused(world, with_name(LINE + 3)[0], b"18: Invalid table name: NN\n")
 
 
 def test_line_whose_rest_is_an_attribute(world):
-    """It begins with a blank."""
+    """The rest begins with a blank."""
     source, name = with_name(LINE + 1, b" Description=9")
     source = source.replace(b"\tDescription=1\n\tDisplayName=2\n\tId", b"\tDisplayName=2\n\tId")
     image = compiled(world, source)
@@ -335,29 +337,29 @@ def test_line_whose_rest_is_an_attribute(world):
 
 
 def test_header_of_254_characters(world):
-    """With blanks up to the end, which are no text."""
+    """It ends with blanks, which are ignored."""
     header = b"ClassToManagerMapping"
     compiled(world, HEAD.replace(header, header.ljust(LINE + 1)))
 
 
 def test_no_final_newline(world):
-    """The last line counts too."""
+    """The last line is read too."""
     image = compiled(world, HEAD).contents
     check(compiled(world, HEAD[:-1]).contents == image, "another database")
 
 
 def test_empty_file(world):
-    """Nothing is a source without a class."""
+    """A source without a class is refused."""
     refused(world, b"", b"No classes defined\n")
 
 
 def test_one_newline(world):
-    """An empty line is no more."""
+    """It is an empty source."""
     refused(world, b"\n", b"No classes defined\n")
 
 
 def test_only_nuls(world):
-    """Lines that end before they begin."""
+    """Each line ends at its first NUL, so it is empty."""
     for count in (1, LINE + 1, LINE + 2, 100000):
         refused(world, bytes(count), b"No classes defined\n")
 
@@ -371,33 +373,33 @@ def test_carriage_returns(world):
 
 
 def filled(line):
-    """So many lines that they take 100 MB."""
+    """As many copies of a line as fill 100 MB."""
     return line * (LARGE // len(line))
 
 
 def test_large_of_comments(world):
-    """100 MB of comments change nothing."""
+    """100 MB of comments have no effect."""
     good = compiled(world, HEAD).contents
     check(compiled(world, filled(b"# nothing of interest\n") + HEAD).contents == good, "another database")
 
 
 def test_large_of_newlines(world):
-    """The line number goes as far."""
+    """The line number is correct after 100 MB."""
     refused(world, b"\n" * LARGE + b"X", b"%d: Invalid table name: X\n" % (LARGE + 1))
 
 
 def test_large_of_one_line(world):
-    """A comment of 100 MB, whose second part is a header."""
+    """A comment of 100 MB, whose second piece is read as a header."""
     refused(world, b"#" + b"x" * LARGE, b"2: Invalid table name: %s\n" % (b"x" * (LINE + 1)))
 
 
 def test_large_of_blanks(world):
-    """A line of 100 MB that holds nothing."""
+    """A line of 100 MB that contains only blanks."""
     refused(world, b" " * LARGE, b"No classes defined\n")
 
 
 def test_large_of_nuls(world):
-    """A file that was never written."""
+    """100 MB of NULs, like a file that was never written."""
     refused(world, bytes(LARGE), b"No classes defined\n")
 
 
@@ -409,7 +411,7 @@ def test_large_of_values(world):
 
 
 def test_large_of_attributes(world):
-    """As many attributes as there may be, with long texts."""
+    """The highest number of attributes, with long texts."""
     source = HEAD + attributes(COUNT_MAX).replace(b"The default", b"The default" + b"t" * 150)
     check(compiled(world, source).in_class(COUNTS, "6H") == (0, 0, COUNT_MAX, 0, 0, 0), "counts")
 

@@ -1,4 +1,5 @@
-"""The programs under a locale whose numbers have commas: nothing that they read or write changes.
+"""Test that the programs read and write the same in a locale whose numbers have commas. Every test is a function below,
+named for what is read or written.
 
 Every test is a function below, named for what is read or written.
 """
@@ -35,13 +36,13 @@ SOURCE_OF_NUMBERS = HEAD + b"".join(
 )
 
 def elsewhere(world):
-    """How a process is started under that locale."""
+    """The options with which a process is started in that locale."""
     options = world.options()
     return {**options, "env": {**options["env"], **german.environment(world.locales)}}
 
 
 def test_databases(world):
-    """What cdgen makes of floating point."""
+    """Databases with floating-point values."""
     good = world.good(SOURCE_OF_NUMBERS)
     command = [world.program, SOURCE, OUT]
     expect(subprocess.run(command, capture_output=True, timeout=TIMEOUT, **elsewhere(world)), 0)
@@ -49,7 +50,7 @@ def test_databases(world):
 
 
 def inspected(world, *arguments):
-    """What cdef prints of it."""
+    """The output of cdef about such a database."""
     world.write(OUT, world.good(SOURCE_OF_NUMBERS))
     usual = world.inspect(*arguments)
     result = subprocess.run([world.cdef, *arguments], capture_output=True, timeout=TIMEOUT, **elsewhere(world))
@@ -59,21 +60,21 @@ def inspected(world, *arguments):
 
 
 def test_text(world):
-    """Of each number."""
+    """All numbers of the listing."""
     check(b"99.5" in inspected(world, "dump", OUT).stdout, "the number is not in it")
 
 
 def test_json(world):
-    """Of each number."""
+    """All numbers in JSON."""
     check(b"99.5" in inspected(world, "dump", "--json", OUT).stdout, "the number is not in it")
 
 
 def test_sources(world):
-    """Made of a database."""
+    """Sources made from a database."""
     check(b"Range=0.75,99.5" in inspected(world, "source", OUT).stdout, "the number is not in it")
 
 
 def test_findings(world):
-    """Of a database and of a source, which have none."""
+    """A database and a source without findings."""
     inspected(world, "verify", OUT)
     inspected(world, "check", SOURCE)

@@ -36,7 +36,7 @@ def closed(*descriptors):
 
 
 def limited(world, option, kilobytes, *command):
-    """A command in so much memory: option v is the address space, d the data, s the stack."""
+    """A command with a memory limit. Option v is the address space, d the data, s the stack."""
     script = f"ulimit -{option} {kilobytes} && exec {shlex.join(map(str, command))}"
     return subprocess.run(["sh", "-c", script], capture_output=True, timeout=TIMEOUT, **world.options())
 
@@ -60,7 +60,8 @@ def least_memory(world, option, *command):
 
 
 def every_level(least, steps, enough):
-    """From the least memory up, in coarser and coarser steps, until it is enough; how often it was not."""
+    """Calls a function with more and more memory, in growing steps, until it is enough. Returns how often it was not.
+    """
     level = 0
     failures = 0
     while not enough(least + level):
@@ -70,13 +71,13 @@ def every_level(least, steps, enough):
 
 
 def last_line(text):
-    """What is in front of it, and the last line."""
+    """The text before the last line, and the last line."""
     at = text.rfind(b"\n", 0, -1) + 1
     return text[:at], text[at:]
 
 
 def compiles_in(world, option, kilobytes, good, traces, *options):
-    """Whether so much memory is enough; if not, message, status and output have to be right, and the traces up to there."""
+    """Whether this memory is enough. If not, checks message, status and output, and the traces up to that point."""
     world.write(OUT, BEFORE)
     result = limited(world, option, kilobytes, world.program, *options, SOURCE, OUT)
     trace, message = last_line(result.stderr)
@@ -94,7 +95,7 @@ def compiles_in(world, option, kilobytes, good, traces, *options):
 
 
 def compiled_in_all(world, source, option, steps, *options):
-    """A source is compiled in less memory than it needs, and in more and more."""
+    """Compiles a source with less memory than it needs, and then with more and more."""
     good = world.good(source, *options)
     result = world.run(*options, SOURCE, OUT)
     traces = (result.stdout, result.stderr)
@@ -121,7 +122,7 @@ def test_memory_for_the_other_byte_order(world):
 
 
 def test_memory_for_traces(world):
-    """With every trace on, which end where the memory does."""
+    """With all traces, which end where memory ran out."""
     failures = compiled_in_all(world, HEAD + attributes(5000), "v", 30, "-d", "3")
     check(failures > 20, "only", failures, "levels were too low")
 
@@ -132,13 +133,13 @@ LONG_LIST = ATTRIBUTE.replace(b"DataType=String", b"DataType=StringArray") % (1,
 
 
 def test_memory_for_long_lists(world):
-    """Address space for one attribute with many values, which stand in tables that grow."""
+    """Address space for one attribute with many values, which are stored in growing tables."""
     failures = compiled_in_all(world, HEAD + LONG_LIST, "v", 30)
     check(failures > 20, "only", failures, "levels were too low")
 
 
 def test_memory_of_data(world):
-    """The other limit, on the data alone."""
+    """The other limit, which applies to data only."""
     failures = compiled_in_all(world, HEAD + attributes(20000), "d", 30)
     check(failures > 20, "only", failures, "levels were too low")
 
@@ -147,7 +148,7 @@ def test_memory_of_data(world):
 
 
 def inspects_in(world, kilobytes, whole, *arguments):
-    """Whether so much memory is enough for cdef; if not, it says so, behind what it has printed."""
+    """Whether this memory is enough for cdef. If not, cdef must say so, and its output must be the first part of the whole."""
     result = limited(world, "v", kilobytes, world.cdef, *arguments)
     what = (*arguments, f"in {kilobytes} KB:", result.returncode, result.stderr)
     if result.returncode == 0:
@@ -159,7 +160,7 @@ def inspects_in(world, kilobytes, whole, *arguments):
 
 
 def inspected_in_all(world, *arguments):
-    """The same in less memory than cdef needs, and in more and more."""
+    """The same for cdef, with less memory than it needs, and then with more and more."""
     world.write(OUT, world.good(HEAD + attributes(3000)))
     result = world.inspect(*arguments)
     expect(result, 0, stdout=result.stdout)
@@ -194,14 +195,14 @@ STACK = 128  # KB
 
 
 def on_small_stack(world, *command):
-    """A command ends well, and as it always does."""
+    """Checks that a command has the same result with a small stack."""
     usual = subprocess.run(command, capture_output=True, timeout=TIMEOUT, **world.options())
     result = limited(world, "s", STACK, *command)
     expect(result, 0, usual.stderr, usual.stdout)
 
 
 def test_stack_does_not_grow_with_the_source(world):
-    """Many attributes, and one with many values, in either byte order and traced."""
+    """With many attributes, with one attribute of many values, in either byte order, and with traces."""
     least_memory(world, "v", world.program)
     for source in (attributes(20000), LONG_LIST):
         for options in ((), ("-s",), ("-d", "3")):
@@ -211,7 +212,7 @@ def test_stack_does_not_grow_with_the_source(world):
 
 
 def test_stack_of_cdef_does_not_grow(world):
-    """Whatever is read of the same."""
+    """With databases of the same sources."""
     least_memory(world, "v", world.cdef, "--version")
     for source in (attributes(5000), LONG_LIST):
         world.write(OUT, world.good(HEAD + source))
@@ -224,7 +225,7 @@ def test_stack_of_cdef_does_not_grow(world):
 
 
 def unheard(world, **more):
-    """With every trace on, the same database, and the same status for a good and for a wrong source."""
+    """Checks, with all traces, that the database and the status do not change, for a good and for a wrong source."""
     good = world.good(HEAD + attributes(300))
     check(world.run("-d", "3", SOURCE, OUT, **more).returncode == 0, "a good source does not compile")
     check(world.read() == good, "another database")
@@ -234,40 +235,40 @@ def unheard(world, **more):
 
 
 def test_standard_output_closed(world):
-    """Traces go nowhere, least of all into the database."""
+    """Traces are lost. Above all, they are not written to the database."""
     unheard(world, preexec_fn=closed(1))
 
 
 def test_standard_error_closed(world):
-    """Messages go nowhere."""
+    """Messages are lost."""
     unheard(world, preexec_fn=closed(2))
 
 
 def test_all_standard_streams_closed(world):
-    """Source and output do not take their places."""
+    """Source and output do not take the places of the streams."""
     unheard(world, preexec_fn=closed(0, 1, 2))
 
 
 def test_standard_output_closed_leaves_the_message(world):
-    """What cannot be traced is still said."""
+    """Messages are still written although traces cannot be."""
     world.write(SOURCE, WRONG)
     expect(world.run("-d", "3", SOURCE, OUT, preexec_fn=closed(1)), 1, WRONG_MESSAGE)
 
 
 def test_standard_output_full(world):
-    """A device without room."""
+    """A full device."""
     with open("/dev/full", "wb") as full:
         unheard(world, stdout=full)
 
 
 def test_standard_error_full(world):
-    """A device without room."""
+    """A full device."""
     with open("/dev/full", "wb") as full:
         unheard(world, stderr=full)
 
 
 def test_standard_output_on_a_full_file(world):
-    """A file that may not grow: the traces stop, the database does not."""
+    """A file that may not grow: traces end, but the database is complete."""
     good = world.good()
     with open(world.path("trace"), "wb") as trace:
         limits = limit(resource.RLIMIT_FSIZE, BLOCK)
@@ -277,7 +278,7 @@ def test_standard_output_on_a_full_file(world):
 
 
 def without_reader(world, **streams):
-    """The same into a pipe that nobody reads; the signal has its default effect in the child."""
+    """The same with a pipe that nobody reads. In the child process, SIGPIPE has its default effect."""
     reader, writer = os.pipe()
     os.close(reader)
     try:
@@ -287,15 +288,15 @@ def without_reader(world, **streams):
 
 
 def test_standard_output_without_reader(world):
-    """No end by SIGPIPE."""
+    """SIGPIPE does not end the program."""
     without_reader(world, stdout=True)
 
 
 def test_standard_error_without_reader(world):
-    """No end by SIGPIPE."""
+    """SIGPIPE does not end the program."""
     without_reader(world, stderr=True)
 
 
 def test_no_stream_has_a_reader(world):
-    """No end by SIGPIPE."""
+    """SIGPIPE does not end the program."""
     without_reader(world, stdout=True, stderr=True)

@@ -1,4 +1,5 @@
-"""Signals and other programs: what ends cdgen, or cuts its output, leaves no half database.
+"""Test that no half database is left when a signal ends cdgen, or another program shortens its output. Every test is a
+function below, named for what it shows. support/traced.py makes a signal arrive at one system call on the output.
 
 Every test is a function below, named for what it shows.  support/traced.py lets
 a signal arrive at one system call on the output.
@@ -17,7 +18,7 @@ CUT = (1, b"", b"Cannot map CDB file: it was cut while it was written\n")
 
 
 def test_before_the_output_is_opened(world):
-    """What was there stays."""
+    """An existing output is unchanged."""
     for number in ENDING:
         world.write(OUT, BEFORE)
         ended_by(struck(world, "read", number, file=SOURCE), number)
@@ -25,7 +26,7 @@ def test_before_the_output_is_opened(world):
 
 
 def test_before_the_output_is_emptied(world):
-    """What was there stays, and no empty file is left where nothing was."""
+    """An existing output is unchanged; otherwise no empty file is left."""
     for number in ENDING:
         for stage in ("openat", "flock"):
             world.write(OUT, BEFORE)
@@ -37,7 +38,7 @@ def test_before_the_output_is_emptied(world):
 
 
 def test_while_the_output_is_written(world):
-    """The output goes, and the program ends as the signal wants it."""
+    """The output is removed, and the signal ends the program."""
     for number in (*ENDING, signal.SIGBUS):
         for stage in STAGES:
             world.write(OUT, BEFORE)
@@ -46,7 +47,7 @@ def test_while_the_output_is_written(world):
 
 
 def test_two_signals_at_once(world):
-    """The second does not keep the first from removing the output."""
+    """The second one does not prevent the removal of the output after the first."""
     world.write(OUT, BEFORE)
     stats = "%%stat"
     ended(traced(world, f"{stats},mmap", []))
@@ -59,7 +60,7 @@ def test_two_signals_at_once(world):
 
 
 def test_ignored_ones_stay_ignored(world):
-    """As for what goes on in the background when its terminal is closed."""
+    """As for a background program whose terminal is closed."""
     good = world.good()
     for number in ENDING:
         actual = ended(struck(world, "mmap", number, disposition=signal.SIG_IGN))
@@ -68,7 +69,7 @@ def test_ignored_ones_stay_ignored(world):
 
 
 def test_bus_error_from_another_program(world):
-    """It is not reported as a file that was cut; without an output, too."""
+    """It is not mistaken for an output that was shortened, with or without an output."""
     for call, file in (("mmap", OUT), ("read", SOURCE)):
         process, child = stopped(world, call, file=file)
         os.kill(child, signal.SIGBUS)
@@ -78,7 +79,7 @@ def test_bus_error_from_another_program(world):
 
 
 def test_uncatchable_signal_leaves_no_lock(world):
-    """What it leaves is replaced by the next compilation."""
+    """The next compilation replaces the unfinished output."""
     good = world.good()
     ended_by(struck(world, "mmap", signal.SIGKILL), signal.SIGKILL)
     check(world.path(OUT).exists(), "the case is void")
@@ -86,7 +87,7 @@ def test_uncatchable_signal_leaves_no_lock(world):
 
 
 def cut_at(world, call, contents):
-    """What becomes of an output that another program writes anew, just after a system call."""
+    """The result when another program rewrites the output just after a system call."""
     process, child = stopped(world, call)
     world.path(OUT).write_bytes(contents)
     check(continued(process, child) == CUT, "not refused")
@@ -94,7 +95,7 @@ def cut_at(world, call, contents):
 
 
 def test_output_cut_before_it_is_mapped(world):
-    """Shorter than it was filled, be it by a page or by a few bytes: the file is the other program's."""
+    """By a page or by a few bytes. The file is left as the other program made it."""
     for source in (HEAD, HEAD + attributes(1000)):
         world.write(SOURCE, source)
         for contents in (b"", b"other", b"other" * 150):
@@ -102,7 +103,7 @@ def test_output_cut_before_it_is_mapped(world):
 
 
 def test_output_cut_after_it_is_mapped(world):
-    """A message and a status; the file keeps its size."""
+    """The compilation fails with a message, and the file keeps its size."""
     for source in (HEAD, HEAD + attributes(1000)):
         world.write(SOURCE, source)
         for contents in (b"", b"other"):
@@ -110,7 +111,7 @@ def test_output_cut_after_it_is_mapped(world):
 
 
 def test_output_grown_before_it_is_mapped(world):
-    """What is too much is cut off again."""
+    """The file is cut to its correct size."""
     good = world.good(HEAD + attributes(100))
     process, child = stopped(world, "writev")
     os.truncate(world.path(OUT), 100000)

@@ -1,4 +1,4 @@
-"""All that changes is in a context: the libraries have no variables of their own but those that are named here."""
+"""Test that all state is in contexts: the libraries have no variables except those that are listed here."""
 
 import re
 import subprocess
@@ -35,7 +35,7 @@ WRITABLE = re.compile(r" \.t?(?:data|bss)(?!\.rel\.ro)(?:\.\S+)?\t\S+ +(.*)$", r
 
 
 def writable(archive):
-    """The names of all variables in writable sections of object files, without what the compiler puts there itself."""
+    """The names of all variables in writable sections of object files, except those that the compiler itself adds."""
     command = ["objdump", "--syms", "--demangle", archive]
     listed = subprocess.run(command, capture_output=True, text=True, check=True).stdout
     return {name for name in WRITABLE.findall(listed) if not name.startswith(".")}
@@ -43,20 +43,21 @@ def writable(archive):
 
 @pytest.fixture(autouse=True)
 def without_sanitizers():
-    """They add variables of their own."""
+    """Sanitizers add variables of their own."""
     if PROGRAMS.sanitizers:
         pytest.skip("sanitizers have state of their own")
 
 
 @pytest.mark.parametrize("name", LIBRARIES)
 def test_no_state_outside_of_contexts(name):
-    """A variable that is missing here is either to be moved into a context, or to be named above with its reason."""
+    """A variable that this test finds must be moved into a context, or be listed above with a reason."""
     allowed = "|".join(ALLOWED.get(name, ["(?!)"]))
     assert [each for each in sorted(writable(PROGRAMS.build / LIBRARIES[name])) if not re.fullmatch(allowed, each)] == []
 
 
 def test_a_variable_is_seen(directory):
-    """Of every kind: with and without a value, in a function, for each thread; constants are none."""
+    """Variables of every kind are found: with and without a value, in a function, for each thread. Constants are not.
+    """
     text = """
     #include <string>
     int with_value = 1;
@@ -71,7 +72,7 @@ def test_a_variable_is_seen(directory):
 
 
 def test_the_reader_ends_no_process():
-    """And it meets no signals."""
+    """And it handles no signals."""
     command = ["nm", "--undefined-only", "--demangle", PROGRAMS.build / LIBRARIES["reader"]]
     needed = subprocess.run(command, capture_output=True, text=True, check=True).stdout.split()
     assert not {"exit", "_exit", "quick_exit", "abort", "raise", "kill", "signal", "sigaction"} & set(needed)

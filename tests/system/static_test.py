@@ -1,4 +1,4 @@
-"""How the programs were linked."""
+"""Test how the programs are linked."""
 
 import re
 import subprocess
@@ -10,7 +10,7 @@ from programs import PROGRAMS
 
 @pytest.mark.parametrize("program", ["cdgen", "cdef"])
 def test_static(program):
-    """With CDGEN_STATIC a program needs no shared library and no interpreter."""
+    """With CDGEN_STATIC, a program needs no shared library and no dynamic loader."""
     if not PROGRAMS.is_on("CDGEN_STATIC") or PROGRAMS.sanitizers:
         pytest.skip("not linked statically in this build")
     command = [PROGRAMS.cache["CMAKE_READELF"], "--program-headers", "--wide", PROGRAMS.build / program]

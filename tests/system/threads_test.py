@@ -1,4 +1,4 @@
-"""Several compilations, checks and readings at once in one process give what each gives alone."""
+"""Test that several compilations, checks and readings at once in one process have the same results as each alone."""
 
 import shutil
 import subprocess
@@ -14,7 +14,7 @@ COPIES = 8
 
 
 def test_at_once(directory):
-    """By the libraries' functions."""
+    """With the functions of the libraries."""
     command = [PROGRAMS.build / "tests/two_at_once", directory, *SOURCES]
     done = subprocess.run(command, env=environment(), capture_output=True, text=True, timeout=600, check=False)
     assert (done.returncode, done.stdout, done.stderr) == (0, "", "")
@@ -22,7 +22,7 @@ def test_at_once(directory):
 
 @pytest.mark.parametrize("form", ["text", "json"])
 def test_build(directory, form):
-    """By `cdef build`, which replaces databases that are there, and has a thread that waits for signals."""
+    """With `cdef build`, which replaces existing databases and has a thread that waits for signals."""
     names = [f"{number}-{source.name}" for number in range(COPIES) for source in SOURCES]
     for name in names:
         shutil.copy(next(source for source in SOURCES if name.endswith(source.name)), directory / name)

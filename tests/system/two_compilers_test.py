@@ -29,13 +29,13 @@ def two_sources(world):
 
 
 def second(world):
-    """How the second compiler ends."""
+    """The result of the second compiler."""
     result = world.run(OTHER, OUT)
     return result.returncode, result.stdout, result.stderr
 
 
 def test_second_comes_before_the_first_has_locked(world):
-    """Both succeed, and the file is the first's, which wrote last."""
+    """Both succeed, and the file is that of the first, which wrote last."""
     mine, other = two_sources(world)
     for before in (None, BEFORE):
         if before is None:
@@ -59,7 +59,7 @@ def test_second_comes_after_the_first_has_locked(world):
 
 
 def test_output_vanishes_before_it_is_locked(world):
-    """As when the other compiler fails and removes it: it is made anew."""
+    """As when another compiler fails and removes it. The file is created again."""
     mine, _ = two_sources(world)
     world.write(OUT, BEFORE)
     process, child = stopped(world, "openat")
@@ -68,7 +68,7 @@ def test_output_vanishes_before_it_is_locked(world):
 
 
 def test_output_is_replaced_before_it_is_locked(world):
-    """By the other compiler, after a third program removed it: the first writes the file that has the name."""
+    """By the other compiler, after a third program has removed it. The first writes to the new file."""
     mine, other = two_sources(world)
     world.write(OUT, BEFORE)
     process, child = stopped(world, "openat")
@@ -79,7 +79,7 @@ def test_output_is_replaced_before_it_is_locked(world):
 
 
 def test_output_turns_into_the_source_before_it_is_locked(world):
-    """What is opened anew is asked anew whether it is the source."""
+    """When the output is opened again, it is checked again."""
     world.write(OUT, BEFORE)
     process, child = stopped(world, "openat")
     world.path(OUT).unlink()
@@ -89,7 +89,7 @@ def test_output_turns_into_the_source_before_it_is_locked(world):
 
 
 def test_signal_removes_no_file_of_another(world):
-    """The first's file has lost its name to the second's, which stays."""
+    """The name now refers to the second compiler's file, which is not removed."""
     _, other = two_sources(world)
     for number in (signal.SIGTERM, signal.SIGUSR1):
         process, child = stopped(world, "mmap")
@@ -101,7 +101,7 @@ def test_signal_removes_no_file_of_another(world):
 
 
 def test_output_that_never_keeps_its_name(world):
-    """The compiler gives up in the end."""
+    """The compiler gives up after some attempts."""
     world.write(OUT, BEFORE)
     stats = "%%stat"
     check(ended(traced(world, f"{stats},ftruncate", [])) == SUCCESS, "the program cannot be traced")
@@ -111,7 +111,7 @@ def test_output_that_never_keeps_its_name(world):
 
 
 def test_file_system_without_locks(world):
-    """It is written without one; any other failure is reported."""
+    """The output is written without a lock. Any other failure to lock is reported."""
     good = world.good()
     for error in ("EOPNOTSUPP", "ENOSYS", "ENOLCK", "EINVAL"):
         world.write(OUT, BEFORE)
@@ -123,7 +123,7 @@ def test_file_system_without_locks(world):
 
 
 def test_output_that_is_no_file_is_not_locked(world):
-    """Two compilers meet the null device as one does."""
+    """Two compilers may write to the null device at once."""
     world.path(OUT).symlink_to("/dev/null")
     status = ended(traced(world, "flock", ["flock:error=EIO"], file="/dev/null"))
     check(status == (1, b"", b"Cannot map CDB file: Invalid argument\n"), status)
@@ -131,7 +131,7 @@ def test_output_that_is_no_file_is_not_locked(world):
 
 @pytest.mark.slow(10)
 def test_many_pairs(world):
-    """The file is that of one that ended with status 0; one that did not was refused."""
+    """The file is that of a compiler that ended with status 0. If one did not, it was refused."""
     mine, other = two_sources(world)
     random.seed(1)
     for _ in range(300):
@@ -146,7 +146,7 @@ def test_many_pairs(world):
 
 @pytest.mark.slow(10)
 def test_many_pairs_of_which_one_is_ended(world):
-    """The file is a whole database or is not there: the victim may have begun after the rival had ended."""
+    """The file is complete or does not exist, because the victim may have begun after its rival had ended."""
     mine, other = two_sources(world)
     random.seed(2)
     for _ in range(300):

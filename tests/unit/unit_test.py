@@ -1,4 +1,4 @@
-"""The unit tests, which are C++: every test of GoogleTest is one here, and a test suite is one run of the program."""
+"""Runs the C++ unit tests: each test of GoogleTest is one test here, and each test suite is one run of the program."""
 
 import collections
 import functools
@@ -28,7 +28,7 @@ def listed():
 
 
 def run(chosen):
-    """What the tests that a filter chooses have to say: name -> report; and the end of a run that did not reach it."""
+    """The reports of the tests that a filter selects: name -> report; and the output of a run that ended early."""
     with tempfile.NamedTemporaryFile(suffix=".json") as report:
         command = [*runner(), PROGRAMS.unit, f"--gtest_filter={chosen}", f"--gtest_output=json:{report.name}"]
         done = subprocess.run(command, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, timeout=TIMEOUT, check=False)
@@ -40,7 +40,7 @@ def run(chosen):
 
 @functools.cache
 def run_suite(suite):
-    """A whole suite, once."""
+    """Runs a whole suite, once."""
     return run(f"{suite}.*")
 
 

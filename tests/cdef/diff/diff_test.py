@@ -295,9 +295,9 @@ def test_missing_values_are_nothing(programs):
 def test_fields_without_a_line_are_compared(programs):
     """Fields that no source sets, in the header, an anchor, the class, the manager and the map."""
     name = programs.compile(class_source(head="\tName=C\n"), "one.cdef")
-    # Anchors stand at 80; the class at 128 has 224 bytes and strings of 8, the manager 24 and 16, then comes the map.
+    # Anchors start at 80. The class at 128 has 224 bytes and strings of 8, the manager 24 and 16; then comes the map.
     places = {12: 1, 92: 2, 128 + 208: 3, 128 + 232 + 4: 4, 128 + 232 + 40 + 30: 5}
-    # The manager's table of strings stands at its end; a reversal leaves it, so it reads as it stands.
+    # The manager's table of strings is at its end. A reversal does not change it, so both byte orders read the same.
     places[128 + 232 + 16] = 6
     programs.compile(class_source(head="\tName=C\n"), "two.cdef")
     for offset, value in places.items():
@@ -479,7 +479,7 @@ def test_mentions_in_json(programs):
 def test_references_that_are_never_set_may_be_none(programs):
     """"None" is equal to 0, which the compiler writes."""
     for order in make_images.ORDERS:
-        # Of a dynamic attribute of the class, which stands at 368, and of the manager, at 1328.
+        # Of a dynamic attribute of the class, which is at 368, and of the manager, at 1328.
         one, two = programs.image("small", order), programs.image("small", order, "u32 392 -1", "u32 1344 -1")
         same(programs.diff(one, two), (0, "", ""), order)
         three = programs.image("small", order, "u32 392 24")
@@ -518,7 +518,7 @@ string "D"
 include tail.inc
 """
 
-# Expressions at 0, where the class's name stands: that is how one that was not given may look.
+# Expressions at 0, where the class's name is stored: an expression that was not given may have this reference.
 SAME_TEXT = """
 include common.inc
 section class

@@ -293,7 +293,7 @@ def test_offsets_in_json():
 def test_offsets_of_lists():
     """The places of lists and their entries follow from the sizes of everything before them."""
     text = dump(database("odd"), "--offsets")
-    # 160 the class; its lists of varieties begin 616 behind, each 16 bytes, the values at 736.
+    # The class is at 160. Its lists of varieties begin 616 bytes further, with 16 bytes each, and the values at 736.
     for line in (
         '    persistent resource attribute "Handle" at 456',
         "      u_ra_variety_list at 792",

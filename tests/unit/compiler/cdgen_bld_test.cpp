@@ -214,7 +214,7 @@ TEST_F(ImageSection, ClassIsItsRecordAndItsTablesInOrder) {
     add_class({{72, 136, 144, 272, 56, 112, 48, 8, 16, 40, 80, 32, 13}}, 5);
     image expected = blank(112 + 1256);
     put_anchor(expected, 0, 5, 112, 1256);
-    /* errors, dependencies and structured byte strings stand at 1016, 1064 and 1088, which nothing says */
+    /* errors, dependencies and structured byte strings are at 1016, 1064 and 1088; no offset is recorded */
     put_class(expected, 112, 5, {224, 296, 432, 576, 848, 904, 0, 0, 1072, 0, 1128, 1208, 1240});
     const struct {
         size_t at, size;

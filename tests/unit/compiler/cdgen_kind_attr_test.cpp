@@ -287,7 +287,7 @@ TEST(DynamicAttribute, GroupIsNoneUnlessGiven) {
 
 /* ---- Values that were not given -------------------------------------------------------------------------------- */
 
-/* The name takes the first 8 bytes of the string table; used counts what is there in the end. */
+/* The name takes the first 8 bytes of the string table. used: the size of the table at the end. */
 struct default_row {
     const char *type;
     vx_uint64_t value;

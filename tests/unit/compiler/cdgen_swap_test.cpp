@@ -296,7 +296,7 @@ TEST(SwapValue, NestingIsFollowed64DeepAndNoFarther) {
 }
 
 TEST(SwapValue, ValuesSideBySideAreNotNested) {
-    constexpr size_t COUNT = 100; /* more than may stand inside each other */
+    constexpr size_t COUNT = 100; /* more than may be inside each other */
     cell_and_strings given(8 + 8 + 8 * COUNT + 8 * COUNT);
     size_t binaries = 16 + 8 * COUNT;
     given.cell.u32(0, 8);

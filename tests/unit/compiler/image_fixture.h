@@ -161,7 +161,7 @@ inline const value_row &valid_value_row(std::uint32_t type) {
 inline const numbers variety_list_head = {{0, 4}, {4, 4}};
 inline const numbers variety_entry = {{0, 4}, {4, 4}};
 inline const numbers valid_values_head = {{0, 4}, {4, 4}};
-inline const numbers valid_values_entry = {{16, 2}}; /* besides the values at 0 and 8 */
+inline const numbers valid_values_entry = {{16, 2}}; /* without the values at 0 and 8 */
 inline const numbers sd_def_head = {{0, 4}, {4, 4}};
 inline const numbers sd_element = {{0, 4}, {8, 4}, {12, 2}, {14, 2}, {16, 4}, {24, 4}, {28, 2}};
 

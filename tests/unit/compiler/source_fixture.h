@@ -151,7 +151,7 @@ public:
         return ending_of([&] { compile_all(text); });
     }
 
-    /* One attribute line to the parser alone; the message of a failure may stand in the line. */
+    /* Passes one attribute line to the parser alone. The message of a failure may refer to the line's text. */
     void feed(stanza_id kind, std::string_view text) {
         line = text;
         save_attr(cx, line.data(), kind);
@@ -188,7 +188,7 @@ public:
         return record;
     }
 
-    /* The entries of a list of the class: its count and they stand behind its identifier. */
+    /* The entries of a list of the class. They follow its identifier and its count. */
     template <class Entry> std::vector<Entry> list_at(cdb_ref_t rsrc_class_t::*field, size_t offset) {
         std::vector<Entry> entries(copy_at<vx_uint32_t>(field, offset + 4));
         for (size_t i = 0; i < entries.size(); ++i)
@@ -244,7 +244,7 @@ public:
         return cx.framing.stanzas[kind];
     }
 
-    /* Optional attributes may stand at once. */
+    /* Allows optional attributes at once. */
     void require_nothing(stanza_id kind) {
         state(kind).req_mask = sc_tables[kind].req_mask_cmplt;
     }
@@ -276,7 +276,7 @@ inline ending fed(opened &c, stanza_id kind, const std::string &line) {
     return c.feeding(kind, "\t" + line);
 }
 
-/* Numbers as they stand in a record. */
+/* Numbers as a record contains them. */
 inline std::string number(vx_uint32_t value, size_t width) {
     auto narrow = static_cast<vx_uint16_t>(value);
     return width == 2 ? std::string(reinterpret_cast<const char *>(&narrow), 2)
@@ -293,7 +293,7 @@ constexpr vx_uint64_t cell64(vx_uint64_t bits) {
     return bits;
 }
 
-/* Types whose values stand in their cells: 7 and 9. */
+/* Types whose values are stored in their cells: 7 and 9. */
 struct inline_row {
     const char *type;
     vx_uint64_t seven, nine;

@@ -12,7 +12,7 @@ namespace staged {
 
 using by_hand::image;
 
-/* A class's side tables, in the order in which they stand in the file. */
+/* A class's side tables, in the order of the file. */
 inline constexpr cdb_ref_t rsrc_class_t::*side_tables[] = {
     &rsrc_class_t::u_rc_pattrsC,  &rsrc_class_t::u_rc_dattrsC,  &rsrc_class_t::u_rc_pattrs,
     &rsrc_class_t::u_rc_dattrs,   &rsrc_class_t::u_rc_actionsC, &rsrc_class_t::u_rc_actions,

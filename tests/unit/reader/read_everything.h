@@ -15,7 +15,7 @@ namespace reading {
 /* Adds up what it reads, so that the compiler cannot leave out reading. */
 class everything {
 public:
-    /* deep: values inside values too, to the end. Only for a sound database: in an unsound one a value may stand inside
+    /* deep: values inside values too, to the end. Only for a sound database: in an unsound one a value may be inside
      * of itself more than once, and take for ever. */
     explicit everything(bool into_values) : deep(into_values) {}
 

@@ -25,7 +25,7 @@ std::string spelt(const cdb::region &r) {
 
 /* ---- The worked example ---------------------------------------------------------------------------------------- */
 
-/* A row of the document: where its bytes stand, how many, and what they are; as document.rows has them. */
+/* A row of the document, as document.rows has it: the offset of its bytes, their number, and their meaning. */
 struct document_row {
     std::size_t offset = 0;
     std::size_t size = 0;

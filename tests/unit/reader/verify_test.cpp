@@ -116,7 +116,7 @@ TEST(CdbVerify, SoundImagesHaveNoFindings) {
             }
 }
 
-/* The assembler against the document, which has every byte. */
+/* Compares the assembler's bytes with those of the document, which shows every byte. */
 TEST(CdbVerify, DocumentsImageIsSound) {
     EXPECT_EQ(findings_of(load("document", std::endian::little)), std::vector<std::string>());
     EXPECT_EQ(load("plain", std::endian::little), load("document", std::endian::little));

@@ -9,6 +9,12 @@ namespace compare {
 
 namespace {
 
+/* True if a field may lead to a list whose entries are parts. Most fields do not. */
+bool may_lead_to_parts(const cdb::field &f) {
+    return f.kind == cdb::field_kind::reference &&
+           (f.to == cdb::target::variety_lists || f.to == cdb::target::valid_vals || f.to == cdb::target::sd_defs);
+}
+
 /* The lists that fields of a record lead to, and the tables that follow it. */
 class family_finder {
 public:
@@ -16,8 +22,7 @@ public:
 
     void find() {
         if (n.format != nullptr)
-            for (std::size_t i = 0; i < n.format->fields.size(); ++i)
-                add_list(n.format->fields[i], n.format->facts[i]);
+            add_lists();
         if (n.kind == node_kind::resource_class)
             add_tables();
         if (n.kind == node_kind::variable_class)
@@ -49,8 +54,15 @@ private:
         to.add({first, count, size});
     }
 
+    void add_lists() {
+        std::span<const cdb::field> fields = n.format->fields;
+        for (const cdb::field &f : fields)
+            if (may_lead_to_parts(f))
+                add_list(f, n.format->facts[static_cast<std::size_t>(&f - fields.data())]);
+    }
+
     void add_list(const cdb::field &f, const cdb::field_fact &what) {
-        if (f.kind != cdb::field_kind::reference || what.is == cdb::role::LAYOUT || what.as == cdb::meaning::UNUSED)
+        if (what.is == cdb::role::LAYOUT || what.as == cdb::meaning::UNUSED)
             return;
         std::size_t entries = std::size_t{number_in(n, f)} + cdb::LIST_HEAD;
         if (f.to == cdb::target::variety_lists)

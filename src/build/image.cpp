@@ -4,7 +4,6 @@
 
 #include "format/checksum.h"
 
-#include <algorithm>
 #include <cstring>
 
 namespace build {
@@ -17,8 +16,7 @@ constexpr size_t TIME = offsetof(orb_cdb_header_t, cdb_hdr_timestamp);
 constexpr size_t AFTER_TIME = TIME + sizeof(orb_timeval32_t);
 
 bool is_same(std::span<const std::byte> a, std::span<const std::byte> b, size_t begin, size_t end) {
-    return std::equal(a.begin() + static_cast<std::ptrdiff_t>(begin), a.begin() + static_cast<std::ptrdiff_t>(end),
-                      b.begin() + static_cast<std::ptrdiff_t>(begin));
+    return std::memcmp(a.data() + begin, b.data() + begin, end - begin) == 0;
 }
 
 vx_uint32_t word_at(std::span<const std::byte> image, size_t place) {

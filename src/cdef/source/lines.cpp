@@ -126,7 +126,8 @@ std::vector<stanza_line> lines_of(std::span<const table_attrs> attributes, const
         std::size_t offset = static_cast<std::size_t>(attribute.ta_offset) - start;
         auto field = std::find_if(format.fields.begin(), format.fields.end(),
                                   [offset](const cdb::field &f) { return f.offset == offset; });
-        lines.push_back({&attribute, &*field, &format.fact_of(*field)});
+        const cdb::field_fact &fact = format.fact_of(*field);
+        lines.push_back({&attribute, &*field, &fact, language::fills(attribute, fact)});
     }
     std::sort(lines.begin(), lines.end(), [](const stanza_line &a, const stanza_line &b) {
         return language::comes_before(*a.attribute, *b.attribute);
@@ -146,7 +147,7 @@ const std::vector<stanza_line> &lines_of(stanza_id stanza) {
 }
 
 bool is_plain(const stanza_line &line) {
-    if (line.fact->always || !language::fills(*line.attribute, *line.fact))
+    if (line.fact->always || !line.fills)
         return false;
     if (is_text(line))
         return line.field->to == cdb::target::strings && line.fact->as == PLAIN;
@@ -179,7 +180,7 @@ std::string properties_text(std::uint32_t bits, std::span<const props_t> known, 
 }
 
 void write_plain_line(source_writer &out, const stanza_line &line, const stanza_record &from) {
-    if (!language::fills(*line.attribute, *line.fact))
+    if (!line.fills)
         return;
     if (!is_plain(line))
         no_source(from.place, "no line can give its " + std::string(line.attribute->ta_name));

@@ -8,7 +8,10 @@
 #include "format/records.h"
 #include "language/catalogue.h"
 
+#include <algorithm>
+#include <array>
 #include <optional>
+#include <utility>
 
 namespace cdef::source {
 
@@ -17,6 +20,7 @@ struct stanza_line {
     const table_attrs *attribute;
     const cdb::field *field;
     const cdb::field_fact *fact;
+    bool fills; /* the attribute's lines fill the field */
 
     bool is_required() const {
         return (attribute->req_bit & OPTIONAL) == 0;
@@ -71,16 +75,18 @@ void write_plain_line(source_writer &out, const stanza_line &line, const stanza_
  * fields is called once, for the first of them. */
 template <class Writer> void write_lines(Writer &writer, std::span<const stanza_line> lines) {
     constexpr auto own = Writer::own_lines();
-    std::vector<void (Writer::*)()> done;
+    std::array<bool, own.size()> done = {};
     for (const stanza_line &line : lines) {
         auto found = std::find_if(own.begin(), own.end(),
                                   [&](const own_line<Writer> &o) { return o.offset == line.field->offset; });
         if (found == own.end()) {
             write_plain_line(writer.out, line, writer.from);
-        } else if (std::find(done.begin(), done.end(), found->write) == done.end()) {
-            (writer.*found->write)();
-            done.push_back(found->write);
+            continue;
         }
+        auto same =
+            std::find_if(own.begin(), own.end(), [&](const own_line<Writer> &o) { return o.write == found->write; });
+        if (!std::exchange(done[static_cast<std::size_t>(same - own.begin())], true))
+            (writer.*found->write)();
     }
 }
 

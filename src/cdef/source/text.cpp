@@ -15,13 +15,14 @@ namespace {
 
 constexpr std::string_view BLANKS = " \t";
 
-/* True of a character that is text wherever it is in a line, except that blanks at the end are removed. */
+/* True of a character that is text wherever it is in a line, except that blanks at the end are removed. Letters and
+ * digits, which most characters are, come after the special ones. */
 bool is_never_special(char c) {
-    return c != '\n' && c != '\0' && c != '"' && c != '#' && c != '/';
+    return c > '/' || (c != '\n' && c != '\0' && c != '"' && c != '#' && c != '/');
 }
 
-/* True if the compiler reads the whole line as text: it has no newline, no comment, and nothing at the end that the
- * compiler removes. */
+/* True if the compiler reads a whole line as text that ends with this and has no special characters before it: there is
+ * no newline, no comment, and nothing at the end that the compiler removes. */
 bool is_all_text(std::string_view line) {
     if (std::all_of(line.begin(), line.end(), is_never_special))
         return !line.ends_with(' ') && !line.ends_with('\t');
@@ -41,10 +42,6 @@ bool is_all_text(std::string_view line) {
 bool begins_with_quote(std::string_view text) {
     std::size_t first = text.find_first_not_of(BLANKS);
     return first != std::string_view::npos && text[first] == '"';
-}
-
-bool fits(std::string_view line) {
-    return line.size() <= LINE_MAX_CHARS && is_all_text(line);
 }
 
 /* ---- Values ---------------------------------------------------------------------------------------------------- */
@@ -125,13 +122,18 @@ bool append_attribute_line(std::string &to, std::string_view name, std::string_v
     if (value.empty())
         return false;
     std::size_t start = to.size();
-    to.append("\t").append(name).append("=").append(value);
-    auto line = [&] { return std::string_view(to).substr(start); };
-    bool is_written = !begins_with_quote(value) && fits(line());
+    to += '\t';
+    to.append(name) += '=';
+    std::size_t after_name = to.size();
+    auto fits = [&] {
+        return to.size() - start <= LINE_MAX_CHARS && is_all_text(std::string_view(to).substr(after_name));
+    };
+    to.append(value);
+    bool is_written = !begins_with_quote(value) && fits();
     if (!is_written) {
-        to.resize(to.size() - value.size());
+        to.resize(after_name);
         to.append("\"").append(value).append("\"");
-        is_written = !value.ends_with('\\') && fits(line());
+        is_written = !value.ends_with('\\') && fits();
     }
     if (!is_written)
         to.resize(start);

@@ -334,10 +334,8 @@ void bld_cdb(cdgen &cx) {
     }
 }
 
-std::vector<std::byte> image_in_memory(cdgen &cx) {
-    std::vector<std::byte> image(fit_image(cx));
-    cx.output.gross_file_size = image.size();
-    fill_image(cx, reinterpret_cast<char *>(image.data()));
-    image.resize(static_cast<size_t>(cx.image.dsp - cx.image.chp));
-    return image;
+size_t fill_memory(cdgen &cx, std::span<std::byte> zeros) {
+    cx.output.gross_file_size = zeros.size();
+    fill_image(cx, reinterpret_cast<char *>(zeros.data()));
+    return static_cast<size_t>(cx.image.dsp - cx.image.chp);
 }

@@ -39,9 +39,10 @@ struct image_cursor {
 /* The image. cdb_size also stores counts and sizes in the staged class records. fit_image counts the sections first, so
  * it finds everything that can be wrong with an image before a file exists. */
 void bld_cdb(cdgen &cx);
-/* The same without a file, and always in the machine's own byte order. Both give back the tables of classes that they
- * have written. */
-std::vector<std::byte> image_in_memory(cdgen &cx);
+/* The same without a file, and always in the machine's own byte order: in memory that is filled with zeros and has the
+ * size that fit_image returned. Returns how many bytes are used. Both give back the tables of classes that they have
+ * written. */
+size_t fill_memory(cdgen &cx, std::span<std::byte> zeros);
 size_t fit_image(cdgen &cx);
 size_t cdb_size(cdgen &cx);
 /* Gives back the class that was completed last, and keeps the size of its section: for a compilation without an image.

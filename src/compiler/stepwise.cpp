@@ -66,10 +66,19 @@ void stepwise_compiler::take_line(const attr_text &text) {
 }
 
 void stepwise_compiler::take_source(std::string_view bytes) {
-    open_bytes(bytes);
+    open_bytes({});
+    take_lines(bytes);
+    take_end();
+}
+
+void stepwise_compiler::take_lines(std::string_view lines) {
+    cx.source.cdb_fp.memory = lines;
     for (source_line line = next_line(); line.begin != nullptr; line = next_line())
         if (attr_text text = text_of(line); text.end != nullptr)
             take_line(text);
+}
+
+void stepwise_compiler::take_end() {
     close();
     for (size_t step = 0; step < closing_steps(); ++step)
         take_closing_step(step);
@@ -83,8 +92,8 @@ void stepwise_compiler::take_closing_step(size_t step) {
     ::closing_steps[step](cx);
 }
 
-void stepwise_compiler::size_image() {
-    fit_image(cx);
+size_t stepwise_compiler::size_image() {
+    return fit_image(cx);
 }
 
 void stepwise_compiler::drop_latest_class() {
@@ -92,7 +101,13 @@ void stepwise_compiler::drop_latest_class() {
 }
 
 std::vector<std::byte> stepwise_compiler::image() {
-    return image_in_memory(cx);
+    std::vector<std::byte> whole(size_image());
+    whole.resize(image_in(whole).size());
+    return whole;
+}
+
+std::span<std::byte> stepwise_compiler::image_in(std::span<std::byte> zeros) {
+    return zeros.first(fill_memory(cx, zeros));
 }
 
 std::vector<std::byte> stepwise_compiler::reversed(std::vector<std::byte> image) const {

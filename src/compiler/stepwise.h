@@ -35,15 +35,21 @@ public:
 
     /* A source in memory, from its first line to the last closing step. */
     void take_source(std::string_view bytes);
+    /* The same in parts: the next lines, each with its newline, and, after the last ones, the closing steps. */
+    void take_lines(std::string_view lines);
+    void take_end();
 
     /* The steps at the end of the source, to be taken in this order. */
     static size_t closing_steps();
     void take_closing_step(size_t step);
-    void size_image();
+    /* Returns the most bytes that the database will have. */
+    size_t size_image();
     /* Gives back what only an image needs of the class that was completed last. */
     void drop_latest_class();
     /* The database, in the machine's own byte order; after all closing steps. */
     std::vector<std::byte> image();
+    /* The same in memory that is filled with zeros and has size_image() bytes; returns the part that is used. */
+    std::span<std::byte> image_in(std::span<std::byte> zeros);
     /* That image in the other byte order. */
     std::vector<std::byte> reversed(std::vector<std::byte> image) const;
 

@@ -16,7 +16,12 @@
 #include "format/names.h"
 #include "text/shown.h"
 
+#include <cstdlib>
 #include <unordered_set>
+
+#if defined(__GLIBC__)
+#include <malloc.h>
+#endif
 
 namespace cdef::source {
 
@@ -220,11 +225,8 @@ std::vector<class_plan> plans_of(const cdb::database &db, const cdb::ownership &
     for (const cdb::resource_class &c : db.classes())
         plans.emplace_back(c, owners);
     plans.back().is_last = true;
-    for (class_plan &plan : plans) {
+    for (class_plan &plan : plans)
         plan_order(plan);
-        for (cdb::level level : {cdb::level::of_resource, cdb::level::of_class})
-            plan.of(level).resize(plan.view.dynamic_attributes(level).size());
-    }
     plan_ranges(plans);
     plan_variable_classes(plans, db);
     plan_locator(plans);
@@ -260,6 +262,14 @@ void write_heading(source_writer &out, const std::optional<std::string> &output)
                                     text::quoted_ascii(*output + std::string(SUFFIX)) + ".");
 }
 
+/* Gives the system what has been freed. The C library keeps memory that is freed between blocks that are still used, as
+ * the memory of planning is. */
+void give_back_freed_memory() {
+#if defined(__GLIBC__)
+    malloc_trim(0);
+#endif
+}
+
 } // namespace
 
 std::vector<std::size_t> own_fields(stanza_id stanza) {
@@ -270,11 +280,19 @@ std::vector<std::size_t> own_fields(stanza_id stanza) {
     return sc_tables[stanza].sc_record == STAGED_SD_DEF ? own_element_fields() : own_attribute_fields(stanza);
 }
 
-std::string source_of(const cdb::database &db, const cdb::ownership &owners) {
+proven_source::proven_source(const cdb::database &database, const cdb::ownership &owners) : db(database) {
     require_settable(db);
-    std::vector<class_plan> plans = plans_of(db, owners);
-    std::optional<std::string> output = default_name(plans);
-    source_writer out;
+    plans = plans_of(db, owners);
+    give_back_freed_memory();
+    output = default_name(plans);
+    std::string file = output.value_or("Class") + std::string(SUFFIX);
+    proof compiled(file, db, owners);
+    compose([&](std::string_view part) { compiled.take(part); });
+    compiled.require_equal();
+}
+
+void proven_source::compose(const part_taker &to) const {
+    source_writer out(to);
     write_heading(out, output);
     for (const class_plan &plan : plans) {
         write_control_definition(out, plan.view);
@@ -288,8 +306,7 @@ std::string source_of(const cdb::database &db, const cdb::ownership &owners) {
             write_map(out, db);
         write_steps(out, plan, map_before, end);
     }
-    require_equal(out.text, output.value_or("Class") + std::string(SUFFIX), db, owners);
-    return out.text;
+    out.flush();
 }
 
 } // namespace cdef::source

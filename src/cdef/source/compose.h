@@ -4,17 +4,29 @@
 #ifndef CDGEN_CDEF_SOURCE_COMPOSE_H
 #define CDGEN_CDEF_SOURCE_COMPOSE_H
 
-#include "language/catalogue.h"
-#include "reader/ownership.h"
+#include "cdef/source/steps.h"
+#include "cdef/source/writer.h"
 
 #include <string>
 #include <vector>
 
 namespace cdef::source {
 
-/* Returns a source that compiles to a database with the same meaning as this readable one. Throws no_source_error if
- * there is no such source. */
-std::string source_of(const cdb::database &db, const cdb::ownership &owners);
+/* A source that compiles to a database with the same meaning as a readable one. It is longer than the database, so it
+ * is never kept: it is composed once for the compiler, which proves it, and again for each reader. */
+class proven_source {
+public:
+    /* The database and its owners must stay as long as the source. Throws no_source_error if there is no source. */
+    proven_source(const cdb::database &database, const cdb::ownership &owners);
+
+    /* Composes the source and passes it on in parts. */
+    void compose(const part_taker &to) const;
+
+private:
+    const cdb::database &db;
+    std::vector<class_plan> plans;
+    std::optional<std::string> output; /* see default_name() */
+};
 
 /* Offsets of the fields for whose lines a stanza has special functions; the lines of all other fields are plain. */
 std::vector<std::size_t> own_fields(stanza_id stanza);

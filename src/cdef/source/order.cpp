@@ -4,7 +4,7 @@
 
 #include "cdef/source/runs.h"
 
-#include <limits>
+#include <numeric>
 #include <optional>
 
 namespace cdef::source {
@@ -13,6 +13,7 @@ namespace {
 
 template <class List> std::vector<traces> traces_of(const List &records) {
     std::vector<traces> found;
+    found.reserve(records.size());
     for (const auto &r : records) {
         if constexpr (requires { r.record().u_ac_name; })
             found.push_back({r.record().u_ac_variety_list.offset[0], r.record().u_ac_name.offset[0]});
@@ -106,6 +107,8 @@ std::vector<step> order_of(const std::array<std::vector<traces>, RECORD_TABLES> 
     auto input = inputs.begin();
     std::array<std::size_t, RECORD_TABLES> done = {};
     std::vector<step> order;
+    order.reserve(std::accumulate(records.begin(), records.end(), inputs.size(),
+                                  [](std::size_t sum, const std::vector<traces> &of) { return sum + of.size(); }));
     while (std::optional<traced_step> next = next_record(records, done)) {
         for (; input != inputs.end() && input->left.name < next->left.name; ++input)
             order.push_back(input->what);

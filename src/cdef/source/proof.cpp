@@ -6,12 +6,8 @@
 #include "cdef/source/error.h"
 #include "compare/compare.h"
 #include "compare/writer.h"
-#include "compiler/stepwise.h"
 #include "reader/owners.h"
 #include "text/shown.h"
-
-#include <memory>
-#include <vector>
 
 namespace cdef::source {
 
@@ -26,18 +22,6 @@ std::string words_of_failure(const fatal_exit &failure) {
     for (const char *part : words_of(failure))
         words += part;
     return text::escaped(words);
-}
-
-/* The details of a failure may belong to the compiler, so they are read while it exists. */
-std::vector<std::byte> compiled(std::string_view text, const std::string &output) {
-    no_observer observer;
-    auto compiler = std::make_unique<stepwise_compiler>("source", output.c_str(), observer);
-    try {
-        compiler->take_source(text);
-        return compiler->image();
-    } catch (const fatal_exit &failure) {
-        no_source("database", "its source would not compile: " + words_of_failure(failure));
-    }
 }
 
 /* "DynamicResourceAttribute 'A'": the innermost record or list entry that a difference is about. */
@@ -55,21 +39,49 @@ std::string why_of(const difference &d) {
            text_of(*d.before);
 }
 
+} // namespace
+
+proof::proof(const std::string &named_after, const cdb::database &database, const cdb::ownership &ownership)
+    : db(database), owners(ownership),
+      compiler(std::make_unique<stepwise_compiler>("source", named_after.c_str(), observer)) {}
+
+/* The details of a failure may belong to the compiler, so its words are kept. */
+template <class Step> void proof::attempt(Step step) {
+    try {
+        if (!failure)
+            step();
+    } catch (const fatal_exit &exit) {
+        failure = words_of_failure(exit);
+    }
+}
+
+void proof::take(std::string_view lines) {
+    attempt([&] { compiler->take_lines(lines); });
+}
+
+/* The image is in memory that takes pages only as they are written, while the compiler gives back its tables. */
+void proof::require_equal() {
+    std::unique_ptr<std::byte, free_memory> memory;
+    std::span<std::byte> image;
+    attempt([&] {
+        compiler->take_end();
+        std::size_t size = compiler->size_image();
+        memory.reset(static_cast<std::byte *>(cfg_malloc(size)));
+        image = compiler->image_in({memory.get(), size});
+    });
+    if (failure)
+        no_source("database", "its source would not compile: " + *failure);
+    require_same_meaning(image);
+}
+
 /* The first difference ends the comparison. Most databases come back byte for byte, which is quickly seen. */
-void require_same_meaning(const std::vector<std::byte> &image, const cdb::database &db, const cdb::ownership &owners) {
+void proof::require_same_meaning(std::span<const std::byte> image) const {
     if (build::is_same_but_time(image, db.file().raw()))
         return;
     cdb::database again(image);
     cdb::ownership owners_again = cdb::owners_in(again);
     compare::compare({db, owners}, {again, owners_again},
                      [](const difference &d) { no_source(place_of(d), why_of(d)); });
-}
-
-} // namespace
-
-void require_equal(std::string_view text, const std::string &output, const cdb::database &db,
-                   const cdb::ownership &owners) {
-    require_same_meaning(compiled(text, output), db, owners);
 }
 
 } // namespace cdef::source

@@ -275,6 +275,8 @@ std::optional<std::vector<range_lines>> planner::run() {
 dynamic_attributes attributes_of(const class_plan &plan) {
     dynamic_attributes found;
     found.cut_short = !plan.is_last;
+    found.of_class.reserve(plan.view.dynamic_attributes(cdb::level::of_class).size());
+    found.of_resource.reserve(plan.view.dynamic_attributes(cdb::level::of_resource).size());
     for (const step &s : plan.order) {
         if (!is_dynamic(s.from))
             continue;
@@ -286,8 +288,14 @@ dynamic_attributes attributes_of(const class_plan &plan) {
     return found;
 }
 
+std::optional<std::vector<range_lines>> lines_for(const std::vector<class_plan> &classes) {
+    std::vector<dynamic_attributes> attributes(classes.size());
+    std::transform(classes.begin(), classes.end(), attributes.begin(), attributes_of);
+    return find_range_lines(attributes);
+}
+
 /* The dynamic attributes keep the places of such attributes among the other stanzas. */
-void use(const range_lines &lines, class_plan &plan) {
+void use(range_lines &lines, class_plan &plan) {
     std::size_t of_class = 0, of_resource = 0;
     auto kind = lines.order.begin();
     for (step &s : plan.order)
@@ -295,10 +303,12 @@ void use(const range_lines &lines, class_plan &plan) {
             s = {*kind, *kind == table::dynamic_class_attributes ? of_class++ : of_resource++};
             ++kind;
         }
+    plan.of(cdb::level::of_class).resize(lines.of_class.size());
+    plan.of(cdb::level::of_resource).resize(lines.of_resource.size());
     for (std::size_t i = 0; i < lines.of_class.size(); ++i)
-        plan.of(cdb::level::of_class)[i].range = lines.of_class[i];
+        plan.of(cdb::level::of_class)[i].range = std::move(lines.of_class[i]);
     for (std::size_t i = 0; i < lines.of_resource.size(); ++i)
-        plan.of(cdb::level::of_resource)[i].range = lines.of_resource[i];
+        plan.of(cdb::level::of_resource)[i].range = std::move(lines.of_resource[i]);
 }
 
 } // namespace
@@ -309,9 +319,7 @@ std::optional<std::vector<range_lines>> find_range_lines(const std::vector<dynam
 }
 
 void plan_ranges(std::vector<class_plan> &classes) {
-    std::vector<dynamic_attributes> attributes(classes.size());
-    std::transform(classes.begin(), classes.end(), attributes.begin(), attributes_of);
-    auto lines = find_range_lines(attributes);
+    auto lines = lines_for(classes);
     if (!lines)
         no_source("dynamic attributes", "no combination of Range lines gives all of them their bounds");
     for (std::size_t c = 0; c < classes.size(); ++c)

@@ -28,18 +28,22 @@ bool is_harmless(std::string_view text) {
     return true;
 }
 
+void require_harmless(std::string_view text, const std::string &path) {
+    if (!is_harmless(text))
+        throw failure(path + ": the source contains characters that could control a terminal: write it to a file");
+}
+
 int run(const std::string &path) {
     input in(path);
     cdb::ownership owners = require_readable_aloud(in).owners;
-    std::string text;
     try {
-        text = source::source_of(in.db, owners);
+        source::proven_source proven(in.db, owners);
+        if (isatty(STDOUT_FILENO) != 0)
+            proven.compose([&](std::string_view part) { require_harmless(part, path); });
+        proven.compose(print);
     } catch (const source::no_source_error &e) {
         throw failure(path + ": " + e.what());
     }
-    if (isatty(STDOUT_FILENO) != 0 && !is_harmless(text))
-        throw failure(path + ": the source contains characters that could control a terminal: write it to a file");
-    print(text);
     return OK;
 }
 

@@ -17,8 +17,15 @@ void source_writer::comment(std::string_view lines) {
 }
 
 void source_writer::stanza(std::string_view kind, const record_name &place) {
+    if (parts && text.size() >= FULL)
+        flush();
     text.append("\n").append(kind).append("\n");
     current = place;
+}
+
+void source_writer::flush() {
+    parts(text);
+    text.clear();
 }
 
 void source_writer::line(std::string_view name, std::string_view value) {

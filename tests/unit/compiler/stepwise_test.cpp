@@ -6,6 +6,7 @@
 
 #include <cstring>
 #include <memory>
+#include <span>
 #include <string>
 #include <vector>
 
@@ -118,6 +119,27 @@ TEST_F(Stepwise, SourceIsTakenFromItsFirstLineToTheLastClosingStep) {
     ASSERT_GE(image.size(), sizeof header);
     std::memcpy(&header, image.data(), sizeof header);
     EXPECT_EQ(header.cdb_hdr_length, image.size() - 4);
+}
+
+TEST_F(Stepwise, SourceIsTakenInPartsAndItsImageIsMadeInGivenMemory) {
+    const std::string head = "ControlDefinition\n\tFileVersion=7\n";
+    const std::string map = "ClassToManagerMapping\n\tResourceManager=M\n\tFirstKey=1\n\tLastKey=9\n";
+    no_observer nobody;
+    auto whole = std::make_unique<stepwise_compiler>("source", "Out.cdef", nobody);
+    whole->take_source(head + map + "\tDescriptiveMessageSet=1\n");
+    auto parts = std::make_unique<stepwise_compiler>("source", "Out.cdef", nobody);
+    parts->take_lines(head);
+    parts->take_lines(map);
+    parts->take_lines("\tDescriptiveMessageSet=1\n");
+    EXPECT_EQ(parts->line_number(), 7);
+    parts->take_end();
+    std::vector<std::byte> memory(parts->size_image());
+    std::span<std::byte> image = parts->image_in(memory);
+    std::vector<std::byte> expected = whole->image();
+    ASSERT_EQ(image.size(), expected.size());
+    EXPECT_EQ(std::memcmp(image.data() + sizeof(orb_cdb_header_t), expected.data() + sizeof(orb_cdb_header_t),
+                          expected.size() - sizeof(orb_cdb_header_t)),
+              0); /* the headers differ in their times */
 }
 
 TEST_F(Stepwise, SourceThatLacksARequiredAttributeFailsInAClosingStep) {

@@ -20,8 +20,12 @@ std::string refusal_of(const std::string &text, const std::string &output = "C.c
     std::vector<std::byte> image = compiled::image_of(source_with("9"));
     cdb::database db(image);
     cdb::ownership owners(db, {});
+    cdef::source::proof compiled(output, db, owners);
     try {
-        cdef::source::require_equal(text, output, db, owners);
+        std::size_t half = text.find("ClassToManagerMapping");
+        compiled.take(text.substr(0, half));
+        compiled.take(text.substr(half));
+        compiled.require_equal();
     } catch (const cdef::source::no_source_error &e) {
         return e.what();
     }

@@ -20,6 +20,21 @@ TEST(SourceWriter, WritesStanzasAndLines) {
     EXPECT_EQ(out.text, "\nResourceClass\n\tDescription=5\n\nControlDefinition\n# a\n# b\n");
 }
 
+/* Two stanzas, of which the first has 65,536 bytes or more. */
+TEST(SourceWriter, PassesOnPartsThatEndWhereAStanzaBegins) {
+    std::vector<std::size_t> sizes;
+    source_writer out([&](std::string_view part) { sizes.push_back(part.size()); });
+    out.stanza("ResourceClass", place_of("ResourceClass", "C"));
+    std::size_t before = out.text.size();
+    for (int i = 0; i < 10000; ++i)
+        out.line("GroupID", 7);
+    EXPECT_TRUE(sizes.empty());
+    out.stanza("ResourceAction", place_of("ResourceAction", "A"));
+    std::size_t after = out.text.size();
+    out.flush();
+    EXPECT_EQ(sizes, (std::vector<std::size_t>{before + 110000, after}));
+}
+
 TEST(SourceWriter, TakesTheFirstTextThatFits) {
     source_writer out;
     out.line_of_any("Name", {"a\nb", "c", "d"});

@@ -4,8 +4,8 @@
  *
  *     launch RUNS STDIN STDOUT FRESH PROGRAM [ARGUMENT...]
  *
- * FRESH is a file that is removed before each run, so that each run creates it. This is written in C because a program's
- * peak memory begins with that of its parent: an interpreter as the parent would hide what small programs take.
+ * FRESH is a file that is removed before each run, so that each run creates it. This is written in C because the peak
+ * memory of a program begins with that of its parent: an interpreter would hide what small programs take.
  */
 #define _DEFAULT_SOURCE
 #include <fcntl.h>

@@ -1,4 +1,4 @@
-/* harmless.cpp: what may be shown on a terminal. */
+/* harmless.cpp: which texts may be shown on a terminal. */
 
 #include "harmless.h"
 

@@ -6,7 +6,7 @@
 
 namespace fuzz {
 
-/* Fails if a terminal would act upon the text, or if it is not UTF-8. */
+/* Fails if the text could control a terminal, or if it is not UTF-8. */
 void expect_harmless(const std::string &text);
 
 } // namespace fuzz

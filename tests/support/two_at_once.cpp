@@ -1,6 +1,6 @@
-/* two_at_once: does the same work in several threads at once as alone before, and ends with 1 if anything comes out
- * otherwise: compiles sources, each in a thread of its own; checks them, two threads each; and verifies and reads their
- * databases, two threads each. ThreadSanitizer ends the program if they share what they must not.
+/* two_at_once: does the same work first alone and then in several threads at once, and ends with 1 if any
+ * result differs. It compiles sources, each in a thread of its own, checks them, in two threads each, and verifies and
+ * reads their databases, in two threads each. ThreadSanitizer ends the program if threads share state.
  *
  *     two_at_once DIRECTORY SOURCE...
  */

@@ -27,7 +27,7 @@ inline std::map<std::string, std::string> sections() {
     return found;
 }
 
-/* What a section says below its title. */
+/* The text of a section below its title. */
 inline std::string body_of(const std::string &section) {
     return section.substr(std::min(section.find("\n\n"), section.size()));
 }

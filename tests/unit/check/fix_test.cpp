@@ -115,7 +115,7 @@ TEST(Fix, LeavesWhatIsOnlyLikely) {
     EXPECT_EQ(fixed(source).text, source);
 }
 
-/* With the right header, the map lacks its manager, and its keys are in the wrong order. */
+/* With the corrected header, the map lacks its manager, and its keys are in the wrong order. */
 TEST(Fix, DropsACorrectionThatBringsMoreErrors) {
     std::string source = replaced(CLASS, "Mapping\n\tResourceManager=M\n\tFirstKey=1", "Maping\n\tFirstKey=5");
     check::fixed_source made = fixed(source);

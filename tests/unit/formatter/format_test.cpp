@@ -1,4 +1,4 @@
-/* Formatting: what becomes of lines, comments and empty lines. */
+/* Formatting: how lines, comments and empty lines change. */
 
 #include "formatter/format.h"
 
@@ -22,7 +22,7 @@ formatter::formatted format(std::string_view source, const formatter::options &h
     return formatter::format(source, "source", how);
 }
 
-/* What becomes of lines after a class. */
+/* The formatted form of lines that follow a class. */
 std::string after_class(std::string_view more, const formatter::options &how = {}) {
     formatter::formatted result = format(class_with(more), how);
     EXPECT_EQ(result.refusal, "");
@@ -52,7 +52,7 @@ TEST(Format, RemovesBlanksAtTheEndsOfLines) {
               "\tReportingInterval=9 # nine\n# end\n");
 }
 
-/* The blanks in front of a quote are no part of the value; those in front of other texts are. */
+/* Blanks in front of a quote do not belong to the value; blanks in front of any other text do. */
 TEST(Format, RemovesBlanksOnlyInFrontOfAQuote) {
     EXPECT_EQ(after_class("\nResourceVariableClass\n\tVariableClass= \t\" S\"\n\tObservationInterval= 9\n"
                           "\tReportingInterval=9\n\tAlias= a  b\n"),

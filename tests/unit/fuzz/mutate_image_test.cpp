@@ -1,5 +1,5 @@
-/* The changes to databases that the fuzzers try: that length and checksum stay right, and that each kind of change
- * comes about. */
+/* The changes to databases that the fuzzers try: length and checksum stay correct, and each kind of change
+ * occurs. */
 
 #include "fuzz/mutate.h"
 

@@ -1,4 +1,4 @@
-/* Whether a class may take the place of an older version. */
+/* Whether a class may replace an older version. */
 
 #include "gate/judge.h"
 

@@ -1,4 +1,4 @@
-/* Measures which names are found for misspelt ones: all texts that one edit makes of the names of the language. */
+/* Measures how many misspelled names are recognised, with all texts that are one edit away from a name. */
 
 #include "format/names.h"
 #include "language/names.h"

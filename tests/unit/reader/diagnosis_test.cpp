@@ -26,7 +26,7 @@ void put(std::vector<std::byte> &image, std::size_t at, std::uint32_t number) {
     std::memcpy(image.data() + at, &number, sizeof number);
 }
 
-/* What the checksum should be after a word was changed. */
+/* The correct checksum after the change of a word. */
 void put_right(std::vector<std::byte> &image, std::size_t at, std::uint32_t number) {
     std::uint32_t before = 0, sum = 0;
     std::memcpy(&before, image.data() + at, sizeof before);

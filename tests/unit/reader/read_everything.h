@@ -1,4 +1,4 @@
-/* read_everything.h: asks every view of a database for everything that it has. */
+/* read_everything.h: reads everything in a database through every view. */
 #ifndef CDGEN_READ_EVERYTHING_H
 #define CDGEN_READ_EVERYTHING_H
 

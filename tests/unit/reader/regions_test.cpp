@@ -216,7 +216,7 @@ TEST(CdbRegions, ErrorsAndDependencies) {
     expect_regions("errors", 0, records);
 }
 
-/* ---- What nothing leads to ------------------------------------------------------------------------------------- */
+/* ---- Bytes that no reference reaches --------------------------------------------------------------------------- */
 
 TEST(CdbRegions, UnreachedValuesAndSections) {
     constexpr expected_region value[] = {{1992, 24, "unreached", 0, ""}};

@@ -39,14 +39,14 @@ std::vector<std::string> findings_of(std::span<const std::byte> image) {
     return spelt(cdb::verify(cdb::database(image)));
 }
 
-/* The same, one by one. */
+/* The findings of the overload that passes each one to a function. */
 std::vector<std::string> findings_handed_over(std::span<const std::byte> image) {
     std::vector<std::string> lines;
     cdb::verify(cdb::database(image), [&lines](cdb::finding &&f) { lines.push_back(spelt(f)); });
     return lines;
 }
 
-/* Changes a byte and puts the checksum right, so that nothing but the byte itself gives the change away. */
+/* Changes a byte and corrects the checksum, so that only the byte itself shows the change. */
 void change(std::span<std::byte> image, std::size_t at, std::byte difference) {
     image[at] ^= difference;
     if (at < 4 || at >= 8)

@@ -1,6 +1,6 @@
-/* How much work a file can make, whatever it says: no test of time, but of what is looked at how often. What is looked
- * at more than once would be reported more than once, so the findings are counted: each image has one thing that much
- * refers to, and something wrong with each of its parts. */
+/* The work that a file can cause. These tests do not measure time but count findings: an object that is visited twice
+ * is reported twice. Each image has one object to which many records refer, and an error in each part of that
+ * object. */
 
 #include "reader/extent.h"
 
@@ -12,9 +12,9 @@ constexpr std::uint32_t NONE = 0xFFFFFFFF;
 
 using words = std::vector<std::uint32_t>;
 
-/* ---- Images of one sort of thing, in this machine's order ------------------------------------------------------- */
+/* ---- Images with many records of one kind, in this machine's order ---------------------------------------------- */
 
-/* What goes into a class. Its records are persistent or dynamic attributes of a resource, all alike. */
+/* The contents of a class. Its records are persistent or dynamic attributes of a resource, all alike. */
 struct parts {
     std::size_t attributes = 1;
     words attribute;         /* 18 words: a persistent one; 34: a dynamic one */
@@ -135,9 +135,9 @@ std::vector<cdb::finding> findings_of(const std::vector<std::byte> &file) {
     return cdb::verify(cdb::database(file));
 }
 
-/* ---- What verify() looks at, and how often ---------------------------------------------------------------------- */
+/* ---- How often verify() visits an object ------------------------------------------------------------------------ */
 
-/* A section that overlaps another one is not looked into: 1000 anchors, and its wrong identifier is found once. */
+/* A section that overlaps another one is not visited: of 1000 anchors, only one leads to the wrong identifier. */
 TEST(CdbVerifyWork, ManyAnchorsToOneSection) {
     words section = class_of({.attribute = persistent(VX_INT32, 0, 0, NONE, NONE, 0xFFFF),
                               .varieties = {0x43444267, 1, 1, 1},
@@ -151,7 +151,7 @@ TEST(CdbVerifyWork, ManyAnchorsToOneSection) {
     EXPECT_EQ(findings.size(), 1000u);
 }
 
-/* A list is looked at for its first owner only: 500 owners of 500 entries, all wrong, and each entry is found once. */
+/* A list is visited for its first owner only: it has 500 owners and 500 wrong entries, and each entry is found once. */
 TEST(CdbVerifyWork, ManyRecordsOfOneList) {
     words list = {0x43444235, 500};
     for (int i = 0; i < 500; ++i)
@@ -170,8 +170,8 @@ TEST(CdbVerifyWork, ManyRecordsOfOneList) {
     EXPECT_EQ(count_of(findings, "CDB308"), 499u + 499u); /* valid values; the one variety list that all refer to */
 }
 
-/* A list at each multiple of 8 that reaches to the end of the table. The first one claims everything; whether a list
- * overlaps another is seen at the first byte that it would claim. */
+/* At each multiple of 8 begins a list that extends to the end of the table. The first list claims everything; the first
+ * byte of each other list shows that it overlaps. */
 TEST(CdbVerifyWork, OverlappingLists) {
     words varieties;
     for (std::uint32_t i = 0; i < 500; ++i)
@@ -207,7 +207,7 @@ TEST(CdbVerifyWork, OverlappingListsFromTheEnd) {
     EXPECT_EQ(count_of(findings, "CDB308"), 499u);
 }
 
-/* Structured data that hold the next ones twice: 2 to the 20th ways to the last one, and 20 second references. */
+/* Each structure contains the next one twice: there are 2 to the 20th paths to the last, and 20 second references. */
 words twice_each(std::size_t levels) {
     words strings = name;
     for (std::uint32_t i = 0; i < levels; ++i) {
@@ -229,7 +229,7 @@ TEST(CdbVerifyWork, StructuresThatShareStructures) {
     EXPECT_EQ(findings.size(), 22u);
 }
 
-/* An array of 1000 references to one array of 1000: it is looked at once, its wrong cells are found once. */
+/* An array of 1000 references to one array of 1000 elements: its wrong cells are visited and found only once. */
 TEST(CdbVerifyWork, ManyCellsOfOneValue) {
     words strings = name;
     append(strings, {1000, 0});
@@ -247,7 +247,7 @@ TEST(CdbVerifyWork, ManyCellsOfOneValue) {
     EXPECT_EQ(count_of(findings, "CDB403"), 999u + 2u); /* and the elements' names */
 }
 
-/* Names without a zero byte: that there is none is found out once, from the end of the strings. */
+/* Names without a zero byte: the strings are searched for one only once, from their end. */
 TEST(CdbVerifyWork, ManyNamesWithoutEnd) {
     words strings(1000, 0x41414141);
     parts p = {.attributes = 500,
@@ -262,7 +262,7 @@ TEST(CdbVerifyWork, ManyNamesWithoutEnd) {
     EXPECT_FALSE(cdb::is_sound(findings));
 }
 
-/* Structured data are compared with their definition, here with a finding; but not again by those who share them. */
+/* Structured data are compared with their definition only once, here with a finding, even if records share them. */
 TEST(CdbVerifyWork, ManyAttributesOfOneStructure) {
     words structures = {0x43444266, 100}, strings = name;
     append(strings, {100, 0});
@@ -283,8 +283,8 @@ TEST(CdbVerifyWork, ManyAttributesOfOneStructure) {
     EXPECT_EQ(findings.size(), 1u + 298 + 198);
 }
 
-/* A text is looked at as far as it is new: neither one that begins amid another nor one that runs into another costs
- * more than that, however long the other is. */
+/* Only the bytes of a text that are new are visited, even if it begins inside another text or runs into another one,
+ * however long the other is. */
 TEST(CdbVerifyWork, TextsOverOneAnother) {
     std::vector<std::byte> area(8 * 100, std::byte{'x'});
     area[8 * 50 - 1] = std::byte{0};

@@ -1,4 +1,4 @@
-/* JSON that is written while it is made. */
+/* Writing JSON piece by piece. */
 
 #include "report/json_writer.h"
 

@@ -1,4 +1,4 @@
-/* Findings as text, and the places in them as other programs want them. */
+/* Findings as text, and their places in the forms of other programs. */
 
 #include "report/places.h"
 #include "report/report.h"

@@ -1,4 +1,4 @@
-/* The order of stanzas, from the traces that they left. */
+/* The order of stanzas, from the traces that they have left in a database. */
 
 #include "cdef/source/order.h"
 

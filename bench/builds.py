@@ -18,7 +18,7 @@ TARGET = 3  # times as fast
 
 
 def classes(directory, count, attributes):
-    """Sources of so many classes, each with so many attributes, and a Makefile for them."""
+    """So many sources, each with so many attributes, and a Makefile for them."""
     text = "".join(generate.source(attributes=attributes))
     for number in range(count):
         own = text.replace("Class_100000", f"Class_{100000 + number}").replace("mgr1.cat", f"mgr{number}.cat")
@@ -28,7 +28,7 @@ def classes(directory, count, attributes):
 
 
 def seconds(directory, *command):
-    """How long a command takes that makes all databases, none of which is there before."""
+    """The time of a command that makes all databases, none of which exists before."""
     for old in directory.glob("*.cdef"):
         old.unlink()
     begun = time.perf_counter()
@@ -41,7 +41,7 @@ def seconds(directory, *command):
 
 
 def main():
-    """Measure, print, and return 1 if the target is missed."""
+    """Measures and prints. Returns 1 if the target is missed."""
     parser = argparse.ArgumentParser(description=__doc__)
     parser.add_argument("--build", type=pathlib.Path, required=True)
     parser.add_argument("--classes", type=int, default=1000)

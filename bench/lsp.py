@@ -43,7 +43,7 @@ class Server:
         return self.process.stdout.read(size)
 
     def await_findings(self):
-        """The findings of the latest version. Only its own bytes are looked at: they may be many."""
+        """Waits for the findings of the latest version. Reads only the version, because there may be many findings."""
         wanted = b'"version":%d}' % self.version
         while wanted not in self.read()[-40:]:
             pass
@@ -55,7 +55,7 @@ class Server:
             pass
 
     def change(self, line, character):
-        """One letter, and one back."""
+        """Inserts a letter, or removes it again in the next call, and waits for the findings."""
         self.version += 1
         self.send("textDocument/didChange", {"textDocument": {"uri": "file:///no/a.cdefsrc", "version": self.version},
                                              "contentChanges": [{"range": {
@@ -66,19 +66,19 @@ class Server:
 
 
 def milliseconds(act):
-    """How long it takes."""
+    """The time that a function takes."""
     begun = time.perf_counter()
     act()
     return (time.perf_counter() - begun) * 1000
 
 
 def percentile(times, share):
-    """The time that this share of all does not exceed."""
+    """The time that this share of all measurements does not exceed."""
     return sorted(times)[min(len(times) - 1, int(len(times) * share))]
 
 
 def main():
-    """Measure, print, and return 1 if the target is missed."""
+    """Measures and prints. Returns 1 if the target is missed."""
     parser = argparse.ArgumentParser(description=__doc__)
     parser.add_argument("--build", type=pathlib.Path, required=True)
     parser.add_argument("--changes", type=int, default=1000)

@@ -18,7 +18,7 @@ MEMBER = re.compile(r"^    (?!return|if|for|while|switch|else|static_assert)\S.*
 
 
 def functions_of(path):
-    """For each line of a source the function that it is in: the last one whose first line stands above it."""
+    """For each line of a source, the function that contains it: the last one whose first line is above it."""
     names, current = [""], "data"
     pattern = MEMBER if path.suffix == ".h" else HEADER
     for line in path.read_text().splitlines():
@@ -38,7 +38,7 @@ class Profile:
         self.read(path)
 
     def named(self, kind, number, name):
-        """A name is written once and then meant by its number."""
+        """A name is written out once and later identified by its number."""
         if name is not None:
             self.names[kind][number] = name
         return self.names[kind][number]
@@ -53,7 +53,7 @@ class Profile:
         return "the C++ library's headers" if "/c++/" in file else f"`{function.split('(')[0].strip('_').split('_avx2')[0]}`"
 
     def read(self, path):
-        """Costs of calls are those of the called and stand there already."""
+        """The costs of calls belong to the called functions and are counted there."""
         file = function = ""
         line, called = 0, False
         for text in pathlib.Path(path).read_text().splitlines():

@@ -1,5 +1,5 @@
-"""The project of examples/projects/bazel, built with Bazel in copies of its own, without a network and with a cache that
-nginx keeps. Only script/test-bazel runs this."""
+"""Test the project of examples/projects/bazel with Bazel: in copies of it, without a network, and with a cache in
+nginx. Only script/test-bazel runs this."""
 
 import contextlib
 import json
@@ -45,7 +45,7 @@ http {{
 
 
 class Workspace:
-    """A copy of the example, and Bazel in it without the settings of a user."""
+    """A copy of the example, and Bazel in it without a user's settings."""
 
     def __init__(self, directory, name):
         self.place = directory / name
@@ -87,7 +87,7 @@ def workspace(directory):
 
 @contextlib.contextmanager
 def cache(directory):
-    """The address of a cache for Bazel, which nginx keeps while the context is open."""
+    """The address of a cache for Bazel, which nginx provides while the context is open."""
     with socket.socket() as free:
         free.bind(("127.0.0.1", 0))
         port = free.getsockname()[1]
@@ -112,7 +112,7 @@ def wait_for(server, port):
 
 
 def compiled(directory, source, order):
-    """The database that the compiler makes of a source, without a time."""
+    """The database that the compiler makes from a source, without a time."""
     (directory / "one.cdefsrc").write_bytes(source)
     options = [] if order == sys.byteorder else ["-s"]
     subprocess.run([PROGRAMS.cdgen, *options, "one.cdefsrc", "one.cdef"], cwd=directory, check=True, env=environment())
@@ -120,13 +120,13 @@ def compiled(directory, source, order):
 
 
 def numbered(number):
-    """A source that differs from all others."""
+    """A source that differs from all other numbers' sources."""
     return DISK.replace(b"Name=Disk\n", b"Name=Disk%d\n" % number).replace(b"4096", b"%d" % (4096 + number))
 
 
 def test_second_workspace_compiles_nothing(directory):
-    """200 databases of 100 classes, made in one workspace, reach another through the cache. Neither the time nor the
-    workspace's path changes a byte."""
+    """200 databases of 100 classes that one workspace has made reach another one through the cache. Neither the time
+    nor the path of the workspace changes a byte."""
     sources = {f"Disk{number}": numbered(number) for number in range(1, 101)}
     with cache(directory) as address:
         found = []
@@ -144,7 +144,7 @@ def test_second_workspace_compiles_nothing(directory):
 
 
 def test_action_sees_named_files_only(workspace):
-    """The program, the source, the project file; and no environment variable."""
+    """The program, the source and the project file, and no environment variable."""
     (workspace.place / "cdef.toml").write_text("[warnings]\nwerror = true\n")
     build = workspace.place / "BUILD"
     build.write_text(build.read_text().replace("src = source,", 'src = source, config = "cdef.toml",'))
@@ -165,7 +165,7 @@ def test_another_program_builds_again(workspace, directory):
 
 
 def test_class_needs_a_name(workspace):
-    """Whatever the project file says. Other warnings are errors, too, unless the project file turns them off."""
+    """Whatever the project file says. Other warnings are errors too, unless the project file turns them off."""
     (workspace.place / "cdef.toml").write_text('[warnings]\noff = ["no-name", "octal"]\nwerror = false\n')
     (workspace.place / "nameless.cdefsrc").write_bytes(DISK.replace(b"\tName=Disk\n", b""))
     (workspace.place / "octal.cdefsrc").write_bytes(DISK.replace(b"LastKey=100", b"LastKey=0144"))
@@ -184,7 +184,7 @@ cdef_database(name = "octal_allowed", src = "octal.cdefsrc", config = "cdef.toml
 
 
 def test_says_that_there_is_no_program(workspace):
-    """With what to do about it."""
+    """The message says what to do."""
     path = [each for each in os.environ["PATH"].split(":") if not os.path.exists(os.path.join(each, "cdef"))]
     if not shutil.which("bazel", path=":".join(path)):
         pytest.skip("Bazel and cdef are in the same directory")

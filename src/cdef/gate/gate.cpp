@@ -122,7 +122,7 @@ const baseline *gate_run::baseline_for(const config::settings &settings) {
     return wanted.empty() ? nullptr : &baselines.try_emplace(wanted, wanted).first->second;
 }
 
-/* A file that nobody has named need not exist. */
+/* The default file need not exist, but one that is named must. */
 ids_file *gate_run::ids_for(const std::string &source, const config::settings &settings) {
     std::string path = options.ids.value_or(settings.ids);
     bool may_be_missing = options.update || path.empty();

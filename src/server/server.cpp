@@ -131,7 +131,7 @@ void server::receive(const frame &message) {
         if (!content.is_object())
             return refuse(nullptr, INVALID_REQUEST, "the message is not an object");
         const json *method = method_of(content);
-        if (method != nullptr && *method == "$/cancelRequest")
+        if (method != nullptr && *method == "$/cancelRequest" && !content.contains("id"))
             return cancel(params_of(content));
         waiting.push_back({std::move(content), message.body.size()});
         waiting_bytes += message.body.size();

@@ -18,14 +18,16 @@ using nlohmann::json;
 constexpr std::size_t ANSWER_MAX =
     64UL * 1024 * 1024; /* the most bytes that the server may send for an input of a few KB */
 
-/* The identifier of a request as text; empty for anything else. */
-std::string request_id(const std::string &body) {
+/* The identifier that the answer to a message must have, as text; empty if there must be no such answer. A message with
+ * an identifier that is not a response is answered, if only to say that its method is missing. */
+std::string answered_id(const std::string &body) {
     json message = json::parse(body, nullptr, false);
-    if (!message.is_object() || !message.contains("id") || !message.contains("method"))
+    if (!message.is_object() || !message.contains("id"))
         return {};
     const json &id = message["id"];
-    bool is_request = (id.is_number_integer() || id.is_string()) && message["method"].is_string();
-    return is_request ? id.dump() : std::string();
+    bool has_method = message.contains("method") && message["method"].is_string();
+    bool is_response = !has_method && (message.contains("result") || message.contains("error"));
+    return (id.is_number_integer() || id.is_string()) && !is_response ? id.dump() : std::string();
 }
 
 class conversation {
@@ -34,7 +36,7 @@ public:
         if (server.exit_status())
             return;
         if (frame.state == lsp::frame_state::whole)
-            if (std::string id = request_id(frame.body); !id.empty())
+            if (std::string id = answered_id(frame.body); !id.empty())
                 ++open[id];
         server.receive(frame);
         if (server.is_full())

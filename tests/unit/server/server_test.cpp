@@ -64,6 +64,23 @@ TEST(Server, AnswersInOrderAndForgetsCancelledRequests) {
     EXPECT_EQ(answers[3].at("id"), 4);
 }
 
+/* What has an identifier is a request, and is answered: this one is unknown. */
+TEST(Server, AnswersACancellationThatIsARequest) {
+    lsp::server server(nothing());
+    std::vector<json> answers = said(server, {INITIALIZE, request(2, "$/cancelRequest", {{"id", 1}})});
+    ASSERT_EQ(answers.size(), 2U);
+    EXPECT_TRUE(answers[0].contains("result"));
+    EXPECT_EQ(answers[1].at("error").at("code"), -32601);
+}
+
+TEST(Server, AnswersAMessageWithAnIdentifierButNoMethod) {
+    lsp::server server(nothing());
+    std::vector<json> answers = said(server, {INITIALIZE, {{"jsonrpc", "2.0"}, {"id", 2}}});
+    ASSERT_EQ(answers.size(), 2U);
+    EXPECT_EQ(answers[1].at("id"), 2);
+    EXPECT_EQ(answers[1].at("error").at("code"), -32600);
+}
+
 /* What a server with one source in a folder says after the client has answered whether it shows progress. */
 std::vector<std::string> progress_after(const json &answer) {
     lsp::surroundings world = nothing();

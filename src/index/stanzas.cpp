@@ -112,10 +112,10 @@ const attribute *index::attribute_at(std::size_t line_number) const {
     std::size_t at = stanza_at(line_number);
     if (at == NONE)
         return nullptr;
-    for (const attribute &each : stanzas[at].attributes)
-        if (each.line == line_number)
-            return &each;
-    return nullptr;
+    const std::vector<attribute> &all = stanzas[at].attributes;
+    auto found = std::lower_bound(all.begin(), all.end(), line_number,
+                                  [](const attribute &each, std::size_t line) { return each.line < line; });
+    return found != all.end() && found->line == line_number ? &*found : nullptr;
 }
 
 span index::extent_of(const stanza &of) const {

@@ -27,9 +27,11 @@ location location_elsewhere(const session &now, const check::elsewhere &other) {
 
 /* The findings of a text, followed by those that other classes cause. */
 std::string diagnostics_in(session &now, const std::string &uri, const document &in,
-                           std::vector<check::finding> findings) {
-    std::vector<check::finding> across = now.sources.across(key_of(uri));
-    findings.insert(findings.end(), across.begin(), across.end());
+                           const std::vector<check::finding> &own) {
+    std::vector<check::finding> all = now.sources.across(key_of(uri));
+    if (!all.empty()) /* a copy of many findings takes long */
+        all.insert(all.begin(), own.begin(), own.end());
+    const std::vector<check::finding> &findings = all.empty() ? own : all;
     auto elsewhere = [&](const check::elsewhere &other) { return location_elsewhere(now, other); };
     return diagnostics_text(in.text(), in.lines(), uri, findings, now.form(), elsewhere);
 }
@@ -67,8 +69,9 @@ report_of_document report_on(session &now, const std::string &uri) {
     auto known = now.sources.files().find(*path);
     document stored(uri, 0, std::move(*text));
     bool is_known = known != now.sources.files().end();
-    return {nullptr, diagnostics_in(now, uri, stored,
-                                    is_known ? known->second.own : stored.findings(now.settings.wanted_in(uri)))};
+    const std::vector<check::finding> &own =
+        is_known ? known->second.own : stored.findings(now.settings.wanted_in(uri));
+    return {nullptr, diagnostics_in(now, uri, stored, own)};
 }
 
 void publish(session &now, const std::string &uri) {
@@ -82,8 +85,9 @@ void publish(session &now, const std::string &uri) {
     if (!found.version.is_null())
         params["version"] = found.version;
     /* The list, which may be long, is already JSON text. */
-    std::string text = R"({"jsonrpc":"2.0","method":"textDocument/publishDiagnostics","params":{"diagnostics":)" +
-                       found.diagnostics + "," + written(params).substr(1) + "}";
+    std::string text = std::move(found.diagnostics);
+    text.insert(0, R"({"jsonrpc":"2.0","method":"textDocument/publishDiagnostics","params":{"diagnostics":)");
+    text.append(",").append(written(params).substr(1)).append("}");
     now.outbox.push_back(std::move(text));
 }
 

@@ -113,8 +113,8 @@ void add_lsp(program &app) {
     command made = app.add("lsp", "Helps editors, by the Language Server Protocol on standard input and output",
                            [options] { return connection(*options).serve(); });
     made.add_flag("--stdio", options->standard_streams, "Ignored: the server always uses standard input and output");
-    made.add("--explanations", options->explanations,
-             "URI of the page that explains the codes, instead of the installed one");
+    made.add("--explanations", options->explanations, "Page that explains the codes, instead of the installed one")
+        .called("URI");
     add_project_options(made, options->project);
 }
 

@@ -2,7 +2,6 @@
 
 #include "compiler/cdgen_attr.h"
 
-#include "compiler/cdgen_stanzas.h"
 #include "compiler/cdgen_values.h"
 
 #include <cstdio>
@@ -81,7 +80,7 @@ void count_required(cdgen &cx, stanza_state &state, const table_attrs &attr) {
 
 } // namespace
 
-void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, stanza_state &state) {
+void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, stanza_state &state, char *record) {
     const table_attrs *expected = state.order.expected(scp, {text.name, static_cast<size_t>(text.end - text.name)});
     auto [name, value, length] = split_line(cx, text, expected);
     if (value == nullptr)
@@ -101,5 +100,5 @@ void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, s
         count_optional(cx, scp, state, attr);
     else
         count_required(cx, state, attr);
-    store_value({cx, scp, state, sc_cb(cx, scp), attr, value, length});
+    store_value({cx, scp, state, record, attr, value, length});
 }

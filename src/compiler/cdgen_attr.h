@@ -15,8 +15,8 @@ struct attr_line {
     size_t length = strlen(value);
 };
 
-/* Takes one attribute line of a stanza of that kind. */
-void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, stanza_state &state);
+/* Takes one attribute line of a stanza of that kind, which fills that staging record. */
+void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, stanza_state &state, char *record);
 
 /* Converts the value and stores it, by the attribute's type. */
 void store_value(const attr_line &line);

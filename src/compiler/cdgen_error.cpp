@@ -23,5 +23,5 @@ void bld_error_exit(message_id id, const char *detail1, const char *detail2, int
 }
 
 void source_error(cdgen &cx, message_id id, const char *detail1, const char *detail2) {
-    cdgen_error_exit(id, detail1, detail2, cx.source.linenum, 1);
+    cdgen_error_exit(id, detail1, detail2, cx.source.shown_line(), 1);
 }

@@ -55,6 +55,7 @@ struct stanza_framing {
     const srtable_ctrl *prev_scp = nullptr;
     const srtable_ctrl *curr_sd_scp = nullptr; /* of the latest header */
     stanza_state *state = nullptr;             /* that of scp */
+    char *record = nullptr;                    /* the staging record that scp fills */
     std::array<stanza_state, SC_COUNT> stanzas;
     std::shared_ptr<dflt_values> spare_dflt; /* no longer held by any stanza; for reuse */
 };

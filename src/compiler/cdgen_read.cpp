@@ -84,6 +84,7 @@ void begin_stanza(cdgen &cx, std::string_view name) {
     cx.framing.prev_scp = cx.framing.scp;
     cx.framing.scp = cx.framing.curr_sd_scp = &sc_tables[static_cast<size_t>(cx.framing.table_id)];
     cx.framing.state = &state_of(cx, cx.framing.scp);
+    cx.framing.record = sc_cb(cx, *cx.framing.scp);
     if (cx.framing.scp->sc_sd_owner != nullptr)
         begin_sd_stanza(cx);
     else
@@ -98,7 +99,7 @@ void take_line(cdgen &cx, const attr_text &text) {
     else if (cx.framing.table_id < 0)
         source_error(cx, MSG_NO_STANZA);
     else
-        save_attr_line(cx, text, *cx.framing.scp, *cx.framing.state);
+        save_attr_line(cx, text, *cx.framing.scp, *cx.framing.state, cx.framing.record);
 }
 
 namespace {

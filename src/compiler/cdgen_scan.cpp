@@ -108,17 +108,26 @@ block_bits scan_block(const char *bytes) {
 #endif
 
 [[gnu::noinline]] void scanned_places::scan(const char *buffer, size_t size) {
-    for (size_t at = 0; at <= size; at += SCAN_BLOCK) {
-        block_bits found = scan_block(buffer + at);
-        newlines.words[at / SCAN_BLOCK] = found.newlines;
-        marks.words[at / SCAN_BLOCK] = found.marks;
+    blocks = size / SCAN_BLOCK + 1;
+    for (size_t block = 0; block < blocks; ++block) {
+        block_bits found = scan_block(buffer + block * SCAN_BLOCK);
+        newlines[block] = found.newlines;
+        marks.words[block] = found.marks;
     }
     uint64_t end = uint64_t{1} << size % SCAN_BLOCK;
-    for (place_set *places : {&newlines, &marks}) {
-        uint64_t &last = places->words[size / SCAN_BLOCK];
-        last = (last & (end - 1)) | end;
-    }
-    block = 0;
-    rest = newlines.words[0];
-    take_newline();
+    newlines[blocks - 1] &= end - 1;
+    marks.words[blocks - 1] = (marks.words[blocks - 1] & (end - 1)) | end;
+    blocks_listed = 0;
+    list_more();
+}
+
+bool scanned_places::list_more() {
+    uint32_t *next = listed.data();
+    for (const uint32_t *full = next + MOST_LISTED - SCAN_BLOCK; next <= full && blocks_listed < blocks;
+         ++blocks_listed)
+        for (uint64_t rest = newlines[blocks_listed]; rest != 0; rest &= rest - 1)
+            *next++ = static_cast<uint32_t>(blocks_listed * SCAN_BLOCK) + static_cast<uint32_t>(std::countr_zero(rest));
+    *next = NO_NEWLINE;
+    taken = 0;
+    return next != listed.data();
 }

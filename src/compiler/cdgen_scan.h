@@ -41,34 +41,39 @@ private:
     std::array<uint64_t, SCAN_BUFFER / SCAN_BLOCK + 1> words;
 };
 
-/* The places of a buffer. In both sets the end of the buffer is the last place, so that every search ends. */
+/* The places of a buffer. */
 struct scanned_places {
+    static constexpr uint32_t NO_NEWLINE = 0xFFFFFFFF;
+
     /* Those of an empty buffer. */
     scanned_places() {
-        newlines.words[0] = marks.words[0] = 1;
+        listed[0] = NO_NEWLINE;
+        marks.words[0] = 1;
     }
 
     /* The buffer has at most SCAN_BUFFER bytes, and SCAN_BLOCK more that may be read. */
     void scan(const char *buffer, size_t size);
 
-    /* The first newline that has not been taken, or the end of the buffer, which cannot be taken. */
+    /* The first newline that is listed and has not been taken. NO_NEWLINE, which cannot be taken, if there is none. */
     size_t newline() const {
-        return next_newline;
+        return listed[taken];
     }
     void take_newline() {
-        while (rest == 0)
-            rest = newlines.words[++block];
-        next_newline = block * SCAN_BLOCK + static_cast<size_t>(std::countr_zero(rest));
-        rest &= rest - 1;
+        ++taken;
     }
+    /* Lists the next newlines when all listed ones have been taken. Returns false if there are none. */
+    bool list_more();
 
-    place_set marks;
+    place_set marks; /* the end of the buffer is the last one, so that every search ends */
 
 private:
-    place_set newlines;
-    size_t next_newline = 0;
-    size_t block = 0;  /* the one that next_newline is in, and */
-    uint64_t rest = 0; /* the newlines after it there */
+    static constexpr size_t MOST_LISTED = 1024;
+
+    std::array<uint64_t, SCAN_BUFFER / SCAN_BLOCK + 1> newlines; /* by block */
+    size_t blocks = 0;
+    size_t blocks_listed = 0;
+    size_t taken = 0;                             /* of the listed newlines */
+    std::array<uint32_t, MOST_LISTED + 1> listed; /* their places, and then NO_NEWLINE */
 };
 
 #endif

@@ -8,7 +8,6 @@
 #include <algorithm>
 #include <cerrno>
 #include <fcntl.h>
-#include <limits>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -48,13 +47,15 @@ bool refill(cdgen &cx) {
 }
 
 /* Takes the next line, of this many bytes, from the buffer. */
-source_line whole_line(source_file &source, size_t length) {
+source_line whole_line(cdgen &cx, size_t length) {
+    source_file &source = cx.source.cdb_fp;
     size_t place = source.pos;
     char *begin = source.buffer.data() + place;
     if (source.mark < place)
         source.mark = source.places.marks.first_from(place);
     source.pos += length + 1;
     source.places.take_newline();
+    ++cx.source.linenum;
     return {begin,
             begin + length,
             source.buffer.data() + source.end,
@@ -71,24 +72,9 @@ source_line cut_line(cdgen &cx, size_t length) {
     memcpy(begin, source.buffer.data() + place, length);
     begin[length] = '\0';
     source.pos += length;
+    ++cx.source.linenum;
     size_t mark = source.places.marks.first_from(place) - place;
     return {begin, begin + length, begin + length, begin + std::min(mark, length), &source.places.marks, place};
-}
-
-source_line some_line(cdgen &cx) {
-    source_file &source = cx.source.cdb_fp;
-    for (;;) {
-        size_t newline = source.places.newline();
-        size_t length = newline - source.pos;
-        if (length < LINE_MAX_CHARS && newline < source.end)
-            return whole_line(source, length);
-        if (length >= LINE_MAX_CHARS)
-            return cut_line(cx, LINE_MAX_CHARS);
-        if (!refill(cx) && source.end > 0)
-            return cut_line(cx, source.end);
-        if (source.end == 0)
-            return {};
-    }
 }
 
 /* The line's first mark from p on; its end if there is none. */
@@ -150,10 +136,19 @@ void take_source(cdgen &cx, std::string_view bytes) {
 }
 
 source_line next_line(cdgen &cx) {
-    source_line line = some_line(cx);
-    if (line.begin != nullptr && cx.source.linenum < std::numeric_limits<int>::max())
-        ++cx.source.linenum;
-    return line;
+    for (source_file &source = cx.source.cdb_fp;;) {
+        size_t length = source.places.newline() - source.pos;
+        if (length < LINE_MAX_CHARS)
+            return whole_line(cx, length);
+        if (source.places.newline() == scanned_places::NO_NEWLINE && source.places.list_more())
+            continue;
+        if (source.end - source.pos >= LINE_MAX_CHARS)
+            return cut_line(cx, LINE_MAX_CHARS);
+        if (!refill(cx) && source.end > 0)
+            return cut_line(cx, source.end);
+        if (source.end == 0)
+            return {};
+    }
 }
 
 attr_text text_of(const source_line &line) {

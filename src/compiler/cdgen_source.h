@@ -5,8 +5,11 @@
 #include "compiler/cdgen_scan.h"
 #include "language/limits.h"
 
+#include <algorithm>
 #include <array>
 #include <cstddef>
+#include <cstdint>
+#include <limits>
 #include <string_view>
 #include <sys/types.h>
 
@@ -39,8 +42,13 @@ struct source_file {
 struct source_reader {
     source_file cdb_fp;
     char inbuf[LINE_MAX_CHARS + 2] = {}; /* a line that has no newline after it in the buffer */
-    int linenum = 0;                     /* reads made; a line of more than LINE_MAX_CHARS takes several */
+    int64_t linenum = 0;                 /* reads made; a line of more than LINE_MAX_CHARS takes several */
     int linepos = 0;                     /* column, from 1 */
+
+    /* The number as messages show it. */
+    int shown_line() const {
+        return static_cast<int>(std::min<int64_t>(linenum, std::numeric_limits<int>::max()));
+    }
 };
 
 /* A line's text, which ends with a NUL. */

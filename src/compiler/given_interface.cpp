@@ -3,6 +3,7 @@
 #include "compiler/given_interface.h"
 
 #include "compiler/cdgen_attr.h"
+#include "compiler/cdgen_stanzas.h"
 #include "compiler/cdgen_values.h"
 
 #include <cstring>
@@ -66,5 +67,6 @@ int strToVar(const char *s, orb_variable_type_t *t) {
 void save_attr(cdgen &cx, char *il, int table_id) {
     char *name = il + strspn(il, " \t");
     auto kind = static_cast<size_t>(table_id);
-    save_attr_line(cx, {il, name, name + strlen(name)}, sc_tables[kind], cx.framing.stanzas[kind]);
+    save_attr_line(cx, {il, name, name + strlen(name)}, sc_tables[kind], cx.framing.stanzas[kind],
+                   sc_cb(cx, sc_tables[kind]));
 }

@@ -54,13 +54,13 @@ void stepwise_compiler::close() {
 void stepwise_compiler::take_line(const attr_text &text) {
     if (text.name != text.line) /* an attribute line begins no stanza */
         return ::take_line(cx, text);
-    auto before =
-        std::tuple(cx.framing.scp, cx.framing.prev_scp, cx.framing.curr_sd_scp, cx.framing.state, cx.framing.table_id);
+    auto before = std::tuple(cx.framing.scp, cx.framing.prev_scp, cx.framing.curr_sd_scp, cx.framing.state,
+                             cx.framing.record, cx.framing.table_id);
     try {
         ::take_line(cx, text);
     } catch (const fatal_exit &) {
-        std::tie(cx.framing.scp, cx.framing.prev_scp, cx.framing.curr_sd_scp, cx.framing.state, cx.framing.table_id) =
-            before;
+        std::tie(cx.framing.scp, cx.framing.prev_scp, cx.framing.curr_sd_scp, cx.framing.state, cx.framing.record,
+                 cx.framing.table_id) = before;
         throw;
     }
 }
@@ -161,6 +161,7 @@ void stepwise_compiler::begin_ownerless_run(int kind) {
     cx.sd.begin_for(nobody, mk_sd_sec(cx));
     cx.framing.scp = cx.framing.curr_sd_scp = &row_of(kind);
     cx.framing.state = &cx.framing.stanzas[static_cast<size_t>(kind)];
+    cx.framing.record = sc_cb(cx, row_of(kind));
     cx.framing.table_id = kind;
     sc_init_tbl (*cx.framing.scp)(cx);
     cx.framing.state->restart();

@@ -56,7 +56,7 @@ public:
     /* ---- State ---- */
 
     int line_number() const {
-        return cx.source.linenum;
+        return cx.source.shown_line();
     }
 
     /* Whether a record of the kind is open. The kinds of structured data share one. */

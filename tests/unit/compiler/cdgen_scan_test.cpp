@@ -60,8 +60,11 @@ void expect_places_of(const std::string &padded, size_t size) {
     for (size_t from = 0; from <= size; from = places->newline() + 1) {
         if (from > 0)
             places->take_newline();
-        ASSERT_EQ(places->newline(), first_in(bytes, from, [](char c) { return c == '\n'; }));
-        if (places->newline() == size)
+        if (places->newline() == scanned_places::NO_NEWLINE)
+            places->list_more();
+        size_t expected = first_in(bytes, from, [](char c) { return c == '\n'; });
+        ASSERT_EQ(places->newline(), expected == size ? scanned_places::NO_NEWLINE : expected);
+        if (expected == size)
             return;
     }
 }
@@ -94,6 +97,11 @@ TEST(Scan, SearchesEndAtTheEndOfTheBuffer) {
         expect_places_of(random_bytes(random, size, 50) + std::string(SCAN_BLOCK, '\n'), size);
 }
 
+TEST(Scan, MoreNewlinesThanAreListedAtOnce) {
+    constexpr size_t SIZE = 3000;
+    expect_places_of(std::string(SIZE, '\n') + std::string(SCAN_BLOCK, '#'), SIZE);
+}
+
 TEST(Scan, FullBuffer) {
     std::mt19937 random(4);
     expect_places_of(random_bytes(random, SCAN_BUFFER, 300) + std::string(SCAN_BLOCK, '#'), SCAN_BUFFER);
@@ -101,7 +109,7 @@ TEST(Scan, FullBuffer) {
 
 TEST(Scan, EmptyFromTheStart) {
     auto places = std::make_unique<scanned_places>();
-    EXPECT_EQ(places->newline(), 0U);
+    EXPECT_EQ(places->newline(), scanned_places::NO_NEWLINE);
     EXPECT_EQ(places->marks.first_from(0), 0U);
 }
 

@@ -47,8 +47,8 @@ constexpr ids_rule rows[] = {
 };
 static_assert(std::size(rows) == static_cast<std::size_t>(ids_breach::UNRECORDED) + 1);
 
-/* The escapes for a tab, a newline and a backslash. */
-constexpr std::pair<char, char> ESCAPES[] = {{'\t', 't'}, {'\n', 'n'}, {'\r', 'r'}, {'\\', '\\'}};
+/* Characters that are written with a backslash, and what follows it. A line that begins with # is a comment. */
+constexpr std::pair<char, char> ESCAPES[] = {{'\t', 't'}, {'\n', 'n'}, {'\r', 'r'}, {'\\', '\\'}, {'#', '#'}};
 
 void append_field(std::string &to, std::string_view text, char end) {
     for (char c : text) {

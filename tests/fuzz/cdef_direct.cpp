@@ -4,6 +4,7 @@
 
 #include "captured.h"
 #include "cdef/dump/dump.h"
+#include "cdef/new/first_source.h"
 #include "cdef/source/compose.h"
 #include "cdef/source/error.h"
 #include "cdef/support/failure.h"
@@ -12,6 +13,8 @@
 #include "compare/compare.h"
 #include "compare/writer.h"
 #include "compiler/stepwise.h"
+#include "gate/ids.h"
+#include "gate/judge.h"
 #include "harmless.h"
 #include "report/report.h"
 
@@ -116,6 +119,27 @@ void compare_directly(const bytes &before, const bytes &after) {
     expect_harmless(shown);
 }
 
+void gate_directly(const bytes &before, const bytes &after) {
+    judged first(before), second(after);
+    if (!first.readable() || !second.readable())
+        return;
+    cdb::ownership was = first.owners(), is = second.owners();
+    std::size_t most = 0;
+    for (compare::level each : compare::levels)
+        try {
+            std::vector<check::finding> found = gate::judge({{first.db, was}, {second.db, is}, ""}, each);
+            require(before != after || found.empty(), "a file breaks itself");
+            require(found.size() >= most, "a level finds less than those before it");
+            most = found.size();
+        } catch (const compare::too_entangled &) {
+            require(before != after, "a comparison without differences is refused");
+        }
+    gate::id_record record;
+    record.accept(gate::numbers_of(first.db));
+    std::string text = record.text();
+    require(gate::id_record(text).text() == text, "recorded numbers are read as others");
+}
+
 /* ---- Sources ---------------------------------------------------------------------------------------------------- */
 
 namespace {
@@ -161,6 +185,11 @@ void check_directly(const bytes &source, const std::string &output, const words 
     expect_harmless(shown);
     std::string message = message_of_compiler(text, output);
     require(first_error.value_or("") == message, "the compiler's error is not the first one");
+}
+
+void start_directly(const std::string &name) {
+    std::optional<std::string> source = cdef::new_command::first_source(name);
+    require(!source || message_of_compiler(*source, "x.cdef").empty(), "a first source does not compile");
 }
 
 } // namespace fuzz

@@ -22,6 +22,12 @@ void compare_directly(const bytes &before, const bytes &after);
  * that the database would have. */
 void check_directly(const bytes &source, const std::string &output, const words &form);
 
+/* Compares two databases, if both can be read, and records the numbers of the first. */
+void gate_directly(const bytes &before, const bytes &after);
+
+/* Makes a first source of a class with this name, if a class can have it. */
+void start_directly(const std::string &name);
+
 } // namespace fuzz
 
 #endif

@@ -2,12 +2,15 @@
  * cdef itself, by its command line.
  *
  * The first byte holds what is done: bits 0 to 3 the form, see forms; of a database, bit 4 sets length and checksum
- * right; of a source that is checked by form 12, bit 4 corrects it too; of a comparison, bit 5 compares the file with
- * itself. The rest is the file; of a comparison, two bytes, the higher first, are the size of the one file, and what
- * follows them is that file and the other. Whatever the files say, the status is one that the documents name, what is
- * shown is text that no terminal acts upon, JSON is JSON, and what the subcommands say of the same file goes together.
+ * right; of a source that is checked by form 12, bit 4 corrects it too; of a source that would be checked, bit 6 builds
+ * it, or else bit 7 takes it as the name of a new class; of a comparison, bit 5 compares the file with itself, and bit
+ * 7 takes the first file as the older version that the second one must not break. The rest is the file; of a
+ * comparison, two bytes, the higher first, are the size of the one file, and what follows them is that file and the
+ * other. Whatever the files say, the status is one that the documents name, what is shown is text that no terminal acts
+ * upon, JSON is JSON, and what the subcommands say of the same file goes together.
  */
 
+#include "build/image.h"
 #include "captured.h"
 #include "cdef/cdef.h"
 #include "cdef/support/failure.h"
@@ -132,6 +135,15 @@ struct files {
         rmdir(directory.c_str());
     }
 
+    /* The contents of the output; empty if it does not exist. */
+    bytes built() const {
+        std::error_code error;
+        return cdb::read_file(output.c_str(), error);
+    }
+    bool has_temporary() const {
+        return access((directory + "/.class.cdef.cdef-new").c_str(), F_OK) == 0;
+    }
+
     memory_file first{"first"};
     memory_file second{"second"};
     std::string directory;
@@ -144,8 +156,9 @@ files &all_files() {
 }
 
 /* The result of compiling a source: the database in its file, or a message. */
-outcome compiled(const memory_file &source) {
-    return run(cdgen_main, {"-n", source.path, all_files().output});
+outcome compiled(const memory_file &source, words options = {}) {
+    options.insert(options.end(), {"-n", source.path, all_files().output});
+    return run(cdgen_main, options);
 }
 
 /* True if the format word is in the header, in either byte order. */
@@ -259,6 +272,22 @@ void look_at_diff(const outcome &came, const bytes &before, const bytes &after, 
     fuzz::require(none == (came.status == cdef::OK), "differences are not told, or none");
 }
 
+void look_at_gate(const outcome &came, const bytes &before, const bytes &after, const words &form) {
+    bool too_often = came.err.find("lead to the same place too often") != std::string::npos;
+    bool refused = before.empty() || (!is_text(before) && !judge(before).readable);
+    if (is_text(before) || is_text(after) || after.empty()) { /* the other tests compile sources */
+        fuzz::require(before != after || came.status != cdef::FOUND, "a source breaks itself");
+        return;
+    }
+    bool readable = !refused && judge(after).readable;
+    fuzz::require((came.status == cdef::FAILED) == (!readable || too_often), "another status");
+    fuzz::require(before != after || came.status != cdef::FOUND, "a file breaks itself");
+    if (came.status == cdef::FAILED || form.back() != "json")
+        return;
+    bool none = parsed(came.out).at("sources").at(0).at("findings").empty();
+    fuzz::require(none == (came.status == cdef::OK), "findings are not told, or none");
+}
+
 /* ---- Sources ------------------------------------------------------------------------------------------------------
  */
 
@@ -311,6 +340,40 @@ void look_at_check(const outcome &came, const bytes &source, const words &form) 
         fuzz::require(came.out.empty(), "findings on standard output");
 }
 
+/* The result of building a source into a file that does not exist, with --timestamp none. */
+void look_at_build(const outcome &came, const bytes &source, const words &form) {
+    const files &f = all_files();
+    auto has = [&](const char *word) { return std::find(form.begin(), form.end(), word) != form.end(); };
+    bytes built = f.built();
+    fuzz::require((came.status == cdef::OK) == !built.empty(), "a database without success, or none");
+    fuzz::require(!f.has_temporary(), "a temporary file is left");
+    if (has_format_word(source)) {
+        fuzz::require(came.status == cdef::FAILED, "a database is built");
+        return;
+    }
+    outcome compiler = has("big") ? compiled(f.first, {"-s"}) : compiled(f.first);
+    bool compiles = compiler.status == 0;
+    bool has_warning = has("--werror") && came.err.find(": warning: ") != std::string::npos;
+    fuzz::require(came.status == (compiles && !has_warning ? cdef::OK : cdef::FOUND), "build and compiler differ");
+    if (came.status == cdef::OK)
+        fuzz::require(build::is_same_but_time(built, f.built()), "build and compiler make different databases");
+    if (has("json"))
+        expect_first(parsed(came.out).at("sources").at(0).at("findings"), compiler.err);
+    else
+        fuzz::require(came.out.empty(), "findings on standard output");
+}
+
+/* A first source compiles. The class is called after the bytes before the first zero. */
+void look_at_new(const outcome &came, const bytes & /*name*/, const words & /*form*/) {
+    fuzz::require(came.status == cdef::OK || came.status == cdef::FAILED, "another status");
+    fuzz::require(came.out.empty() == (came.status != cdef::OK), "half a source");
+    if (came.status != cdef::OK)
+        return;
+    const files &f = all_files();
+    f.second.fill(std::as_bytes(std::span(came.out)));
+    fuzz::require(compiled(f.second).status == 0, "a first source does not compile");
+}
+
 /* ---- The forms ----------------------------------------------------------------------------------------------------
  */
 
@@ -338,6 +401,28 @@ const std::array<form, 16> forms = {{
     {{"check", "--werror"}, look_at_check},
 }};
 
+/* Taken in the place of the forms of check, by bit 6. */
+constexpr unsigned FIRST_CHECK = 12;
+constexpr unsigned BUILD = 0x40;
+const std::array<form, 4> build_forms = {{
+    {{"build"}, look_at_build},
+    {{"build", "--werror"}, look_at_build},
+    {{"build", "--byte-order", "big"}, look_at_build},
+    {{"build", "--format", "json"}, look_at_build},
+}};
+
+/* Taken in the place of the forms of check, by bit 7. */
+constexpr unsigned OTHER = 0x80;
+const form beginning = {{"new", "class"}, look_at_new};
+
+/* Taken in the place of the forms of diff, by bit 7. */
+constexpr unsigned FIRST_DIFF = 9;
+const std::array<form, 3> gate_forms = {{
+    {{"gate", "--level", "readers"}, nullptr},
+    {{"gate", "--level", "stored"}, nullptr},
+    {{"gate", "--level", "clients", "--format", "json"}, nullptr},
+}};
+
 /* Taken in the place of the form "verify" by some bytes. */
 constexpr std::uint8_t OTHERWISE = 0x60;
 const std::array<form, 2> other_forms = {{
@@ -360,7 +445,7 @@ bytes database_of(std::span<const std::byte> data, unsigned options) {
 }
 
 outcome shown(words arguments, const words &paths) {
-    bool is_source = arguments.front() == "source" || arguments == correcting.arguments;
+    bool is_source = arguments.front() == "source" || arguments.front() == "new" || arguments == correcting.arguments;
     arguments.insert(arguments.end(), paths.begin(), paths.end());
     outcome came = cdef_says(arguments);
     if (!is_source) /* it contains texts unchanged */
@@ -383,13 +468,18 @@ pair_of_files pair_in(std::span<const std::byte> data, unsigned options) {
 }
 
 void try_comparison(const form &with, const pair_of_files &both, bool by_command_line) {
-    fuzz::compare_directly(both.before, both.after);
+    bool is_gate = with.arguments.front() == "gate";
+    is_gate ? fuzz::gate_directly(both.before, both.after) : fuzz::compare_directly(both.before, both.after);
     if (!by_command_line)
         return;
     const files &f = all_files();
     f.first.fill(both.before);
     f.second.fill(both.after);
-    look_at_diff(shown(with.arguments, {f.first.path, f.second.path}), both.before, both.after, with.arguments);
+    if (is_gate)
+        look_at_gate(shown(with.arguments, {"--no-config", "--against", f.first.path, f.second.path}), both.before,
+                     both.after, with.arguments);
+    else
+        look_at_diff(shown(with.arguments, {f.first.path, f.second.path}), both.before, both.after, with.arguments);
 }
 
 /* The most bytes of a source that are checked each time, because many unknown names take long. */
@@ -400,6 +490,25 @@ bytes beginning_of(const bytes &source) {
 #else
     return source;
 #endif
+}
+
+void try_build(const form &with, const bytes &file, bool by_command_line) {
+    const files &f = all_files();
+    fuzz::check_directly(beginning_of(file), f.output, with.arguments);
+    if (!by_command_line)
+        return;
+    f.first.fill(file);
+    unlink(f.output.c_str());
+    with.look(shown(with.arguments, {"--no-config", "--timestamp", "none", "-o", f.output, f.first.path}), file,
+              with.arguments);
+}
+
+void try_new(const form &with, const bytes &file, bool by_command_line) {
+    constexpr std::size_t MOST = 64;
+    std::string name(reinterpret_cast<const char *>(file.data()), std::min(file.size(), MOST));
+    fuzz::start_directly(name);
+    if (by_command_line)
+        with.look(shown(with.arguments, {"-o", "-", "--", name.c_str()}), file, with.arguments);
 }
 
 void try_file(const form &with, const bytes &file, bool by_command_line) {
@@ -429,6 +538,13 @@ bool takes_command_line(std::span<const std::uint8_t> data) {
 }
 
 const form &form_for(std::uint8_t choice) {
+    unsigned low = choice & 0xFU;
+    if (low >= FIRST_CHECK && (choice & BUILD) != 0)
+        return build_forms.at(low - FIRST_CHECK);
+    if (low >= FIRST_CHECK && (choice & OTHER) != 0)
+        return beginning;
+    if (low >= FIRST_DIFF && low < FIRST_CHECK && (choice & OTHER) != 0)
+        return gate_forms.at(low - FIRST_DIFF);
     if ((choice & 0x1F) == CORRECTING)
         return correcting;
     bool is_verify = (choice & 0xF) == 0;
@@ -445,6 +561,10 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size
     bool by_command_line = takes_command_line({data, size});
     if (with.look == nullptr && rest.size() >= 2)
         try_comparison(with, pair_in(rest, data[0]), by_command_line);
+    else if (with.look == look_at_build)
+        try_build(with, bytes(rest.begin(), rest.end()), by_command_line);
+    else if (with.look == look_at_new)
+        try_new(with, bytes(rest.begin(), rest.end()), by_command_line);
     else if (with.look != nullptr && with.arguments.front() == "check")
         try_file(with, bytes(rest.begin(), rest.end()), by_command_line);
     else if (with.look != nullptr)

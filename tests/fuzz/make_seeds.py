@@ -26,6 +26,7 @@ OPTIONS = (0x00, 0x08, 0x07, 0x0E, 0x10, 0x20)  # see source_fuzz.cpp
 DATABASE_FORMS = range(9)
 DIFF_FORMS = range(9, 12)
 CHECK_FORMS = range(12, 16)
+BUILD, NEW, GATE = 0x40, 0x80, 0x80
 WHOLE = 0x10
 MORE_WORDS = (
     "0x", "-1", "0", "4294967296", "9223372036854775807", "18446744073709551616", "1e39", "1e-46", "nan", "inf", "0x1p-149",
@@ -58,6 +59,9 @@ def write_cdef_seeds(directory):
     for path in sorted((directory / "source").iterdir()):
         form = CHECK_FORMS[int(path.name) % len(CHECK_FORMS)]
         (seeds / f"source-{path.name}").write_bytes(bytes([form]) + path.read_bytes()[1:])
+        (seeds / f"build-{path.name}").write_bytes(bytes([form | BUILD]) + path.read_bytes()[1:])
+    for number, name in enumerate((b"Disk", b'a "b"', b"\\", b"#,=", b"\xff", b"")):
+        (seeds / f"new-{number}").write_bytes(bytes([CHECK_FORMS[0] | NEW]) + name)
     images = [path.read_bytes() for path in sorted((directory / "image").rglob("*")) if path.is_file()]
     for number, image in enumerate(images):
         whole = WHOLE * (number // len(DATABASE_FORMS) % 2)
@@ -67,6 +71,7 @@ def write_cdef_seeds(directory):
             form = DIFF_FORMS[number % len(DIFF_FORMS)] | whole
             pair = len(image).to_bytes(2, "big") + image + images[(number + 1) % len(images)]
             (seeds / f"pair-{number}").write_bytes(bytes([form]) + pair)
+            (seeds / f"gate-{number}").write_bytes(bytes([form | GATE]) + pair)
 
 
 def conversation(text, line, character):

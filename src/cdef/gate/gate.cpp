@@ -32,7 +32,6 @@ using gate_command::bytes_of;
 using gate_command::ids_file;
 using gate_command::older_version;
 using gate_command::stem_of;
-using gate_command::text_of;
 using gate_command::version;
 
 struct gate_options {

@@ -1,12 +1,11 @@
 #!/usr/bin/env python3
 """Count the instructions of some compilations and compare them with the recorded counts.
 
-Counts do not depend on how busy a machine is, and hardly on which it is: the
-program is static, the simulated processor is told to look like the plainest
-one, and the environment is empty.  What is left is the compiler and the C
-library, whose versions are recorded with the figures.
+The counts do not depend on how busy the machine is, and hardly on the machine itself: the program is static, the
+simulated processor is set to the simplest model, and the environment is empty. What remains are the compiler and the
+C library, whose versions are recorded with the counts.
 
-More than 5 % above a recorded figure fails; 5 % below asks for new records.
+More than 5 % above a recorded count fails. More than 5 % below asks for new records.
 """
 
 import argparse

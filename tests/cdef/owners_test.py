@@ -1,19 +1,17 @@
 """Test that all subcommands agree about the owner of a list of valid values or of a bound, if the reference does not
 show it.
 
-An attribute that a following class cuts short refers to the first list of
-valid values, whether it has that list or none.  Each case is a class that
-another one cuts short, and who has which valid values.  All four subcommands
-have to agree:
+An attribute that a following class cuts short refers to the first list of valid values, whether it has a list or
+not. Each case is a class that another one cuts short, with the expected owner of each list. All four subcommands
+must agree:
 
     verify    warns of each attribute that refers to a list that is not its own
-    dump      shows valid values with their owner, and with nobody else;
-              with --hex, as values of the owner's type
+    dump      shows valid values with their owner only; with --hex, as values of the owner's type
     source    writes them in their owner's stanza
-    diff      adds them to their owner, compared to the class without them
+    diff      shows them as added to their owner, compared with the class without them
 
-A bound may be a number of another type and lead anywhere: the images of
-tests/image/broken, changes to small.image, have such bounds.
+A bound may be a number of another type that looks like a reference. The images in tests/image/broken that change
+small.image have such bounds.
 """
 
 import dataclasses

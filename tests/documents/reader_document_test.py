@@ -1,9 +1,8 @@
-"""Compile and run what docs/reader.md shows.
+"""Compile and run the programs in docs/reader.md.
 
-Every C++ block has to compile by itself, without a warning.  The first one is a
-program, short enough to be read at a glance: what it prints of the example's
-database has to be what the document says, in both byte orders; and of a file
-that is no database nothing.
+Every C++ block must compile by itself without a warning. The first block is a short program. Its output for the
+example's database must be the one in the document, in both byte orders; for a file that is not a database, it must
+print nothing.
 """
 
 import re

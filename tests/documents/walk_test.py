@@ -1,13 +1,13 @@
-"""Runs the commands of a document in their order, and compares the output with that in the document.
+"""Run the commands of a document in their order, and compare the output with that in the document.
 
-Three kinds of blocks count:
+Three kinds of blocks are used:
 
 - A block whose first line is a comment that names a file, `# Disk.cdefsrc` or `// show.cpp`, is written to that file.
 - A block whose first line is `# Add to Fan.cdefsrc` is appended to that file.
-- In a `console` block, lines that begin with `$ ` are commands, and the lines below each are what it prints. A line
-  `...` stands for any lines.
+- In a `console` block, lines that begin with `$ ` are commands, and the lines below each command are its output. A line
+  `...` stands for any number of lines.
 
-The commands find the programs under their own names, and `pkg-config` tells where the library of this build is.
+The programs are on the PATH, and `pkg-config` finds the library of this build.
 """
 
 import os

@@ -307,7 +307,7 @@ json line_of(const json &error) {
 /* The first error is the compiler's. */
 void expect_first(const json &findings, const std::string &message) {
     auto first = std::find_if(findings.begin(), findings.end(), [](const json &f) { return f["severity"] == "error"; });
-    fuzz::require((first == findings.end()) == message.empty(), "an error is told, or none");
+    fuzz::require((first == findings.end()) == message.empty(), "check and the compiler disagree about an error");
     if (message.empty())
         return;
     std::string text = first->at("message");

@@ -1,11 +1,9 @@
-"""Write what the fuzz targets begin with: seeds and a dictionary.
+"""Write the seeds and the dictionary of the fuzzers.
 
-DIRECTORY/source gets the golden sources and generated ones, each behind a byte
-of options; DIRECTORY/image what cdgen makes of them, in both byte orders, and
-the images of tests/image; DIRECTORY/cdef all of these, behind a byte that says
-what is done with them; DIRECTORY/lsp conversations with the language server;
-DIRECTORY/source.dict the words of the language, as the
-compiler's own catalogue has them.
+DIRECTORY/source gets the golden sources and generated ones, each after a byte of options. DIRECTORY/image gets the
+databases that cdgen makes from them, in both byte orders, and the images of tests/image. DIRECTORY/cdef gets all of
+these, each after a byte that selects the subcommand. DIRECTORY/lsp gets conversations with the language server.
+DIRECTORY/source.dict gets the words of the language, from the compiler's own catalogue.
 """
 
 import argparse

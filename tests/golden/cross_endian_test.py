@@ -1,13 +1,11 @@
-"""Compares this machine's cdgen with one for the other byte order.
+"""Compare this machine's cdgen with one for the other byte order.
 
-For every source: the same exit status, messages and traces, with and without
-option s; and the file that one machine writes is, byte for byte, the file that
-the other writes with option s, both ways round.  Options --there and --runner
-of pytest name the other machine's compiler and what runs it here.
+For every source, both have the same exit status, messages and traces, with and without option s. The file that one of
+them writes is, byte for byte, the file that the other one writes with option s, in both directions. Options --there and
+--runner of pytest name the other machine's compiler and the program that runs it on this machine.
 
-What the reversal leaves alone (see docs/format.md) stays in the order of the
-machine that compiled.  A case whose image marks such places may differ there
-and in the checksum, and nowhere else; no other source may differ at all.
+Bytes that the reversal does not change (see docs/format.md) stay in the order of the machine that compiled. If the
+image of a case marks such bytes, the files may differ there and in the checksum. Otherwise they must not differ.
 """
 
 import os

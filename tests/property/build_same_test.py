@@ -1,8 +1,8 @@
-"""Compare "cdef build" with cdgen on many sources: it makes the same databases, byte for byte, of the same sources, and
+"""Compare "cdef build" with cdgen on many sources: from the same source, it makes the same database, byte for byte, and
 its first error is the one that cdgen prints.
 
-The sources are those of check_sound_test.py, and the groups too; half of them are to be compiled for the other byte
-order. Both programs are given the same names of databases, so that classes without a Name are called alike.
+The sources and their groups are those of check_sound_test.py; half of them are compiled for the other byte order.
+Both programs are given the same names of databases, so that classes without a Name get the same name.
 """
 
 import json

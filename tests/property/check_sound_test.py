@@ -1,14 +1,12 @@
 """Compare "cdef check" with cdgen on many sources.
 
-A source has no error exactly when cdgen compiles it, and the first error is
-the one that cdgen prints: the same text and, where cdgen tells one, the same
-line.  Of an error that is reported where its cause is, a note has cdgen's
-line.  The sources are the golden cases; golden cases and examples with a few
-changes; and those of generate_sources.py, as they are and with its mutations.
+cdef check finds no error in a source exactly if cdgen compiles it. Its first error is the one that cdgen prints: the
+same text and, if cdgen prints one, the same line. If an error is reported at its cause, a note has cdgen's line. The
+sources are the golden cases, golden cases and examples with a few changes, and those of generate_sources.py,
+unchanged and with its mutations.
 
-The made ones come in groups, each of which is a test of its own.  Everything
-follows from a group's number.  Option --keep of pytest is a directory for
-sources that differ.
+The generated sources are divided into groups, each of which is a test of its own. Everything follows from a group's
+number. Option --keep of pytest names a directory for sources about which the two programs differ.
 """
 
 import json

@@ -1,10 +1,9 @@
 """Compare the warnings of "cdef check" on generated sources with those of a second implementation.
 
-The opinion is told here once more, in the simplest words and without regard to
-speed: every pair of values, every pair of names.  A warning that is missing and
-one too many are both failures.  The sources are those of generate_sources.py,
-which are right, so that nothing hides a warning.  They are random, so that each
-warning has its cause in some, and something near its cause in many.
+The second implementation is as simple as possible, without regard to speed: it looks at every pair of values and
+every pair of names. Both a missing and an additional warning are failures. The sources are those of
+generate_sources.py, which are correct, so that no error hides a warning. They are random, so that some contain the
+cause of each warning, and many contain something similar.
 """
 
 import dataclasses

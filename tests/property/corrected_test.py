@@ -1,8 +1,9 @@
-"""Plant mistakes that "cdef check --fix" corrects in sound sources, and get the sound sources back.
+"""Plant mistakes that "cdef check --fix" corrects in sound sources, and compare the corrected sources with the sound
+ones.
 
-Whatever is planted, there are never more errors than before, and correcting again changes nothing. A source that
-several mistakes make ambiguous need not become the sound one; one with a single mistake has to, unless a misspelled
-name is as near to two names.
+Whatever is planted, a correction never adds errors, and correcting again changes nothing. A source with a single
+mistake must become the sound source again, unless a misspelled name is equally similar to two names. A source that
+several mistakes have made ambiguous need not.
 """
 
 import json

@@ -1,9 +1,9 @@
-"""Compare `cdef gate` with `cdef diff --compat` on many pairs of sources: at each level, both find the same differences,
-for the same reasons, and the gate is silent about a class that has not changed.
+"""Compare `cdef gate` with `cdef diff --compat` on many pairs of sources: at each level, both find the same differences
+for the same reasons, and the gate reports nothing about a class that has not changed.
 
-The first of two sources is one of generate_sources.py; the second one is the first with a few changes of the kind that
-people make: other numbers, names, types, properties and ranges, and stanzas that are gone or new. Pairs of which one
-does not compile do not count. Everything follows from a group's number.
+The first source of a pair comes from generate_sources.py. The second one is the first with a few changes such as
+people make: other numbers, names, types, properties and ranges, and stanzas that are removed or added. A pair is not
+used if one of its sources does not compile. Everything follows from a group's number.
 """
 
 import json

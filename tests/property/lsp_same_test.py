@@ -1,7 +1,9 @@
-"""What `cdef lsp` shows of many sources is what `cdef check` says, at the right positions, however they were written.
+"""Test that `cdef lsp` shows the findings of `cdef check` for many sources, at the right positions, whatever edits led
+to the text.
 
-The sources are generated, right and mutated, with letters of several scripts and ends of lines of all kinds put into
-them. Positions are counted anew here, from the protocol and from what `cdef check --format json` says in bytes.
+The sources are generated, correct and mutated, with letters of several scripts and all kinds of ends of lines added.
+Positions are computed independently here, from the protocol and from the bytes that `cdef check --format json`
+reports.
 """
 
 import json

@@ -1,12 +1,11 @@
-"""Plants mistakes in sources that are right, and measures how "cdef check" reports them.
+"""Plant mistakes in correct sources, and measure how "cdef check" reports them.
 
-A mistake is found if a finding that the sound source does not have is at a line
-where a report of the mistake is right: its own line, not that of a note.  Every
-error but one is an error that follows from the mistake.  At least 99 of 100
-mistakes are found, with fewer than one error in 100 that follows.
+A mistake is found if there is a finding that the correct source does not have, at a line where the mistake should be
+reported: the line of the finding itself, not that of a note. All errors but one are counted as errors that follow
+from the mistake. At least 99 of 100 mistakes are found, with fewer than one error in 100 that follows from another.
 
-Option --cases of pytest says how many mistakes, at least 1,600; --keep is a directory for the
-sources of those that are not found or are followed by errors.
+Option --cases of pytest is the number of mistakes, at least 1,600. --keep names a directory for the sources of
+mistakes that are not found or that cause further errors.
 """
 
 import collections

@@ -1,19 +1,16 @@
-"""Properties that hold for every source, tried on generated ones.
+"""Test properties of all sources with generated ones.
 
-For a source that is right: it compiles, silently; the database says what the
-source says; its size and checksum are right; it comes out the same the second
-time, in another directory, under other settings of language and time zone, and
-with options n and d; option s gives what support/reverse_cdb.py makes of it, and
-turning that once more gives the first again; cdef verify finds nothing wrong
-with either; and the source that cdef source writes gives the same database.
+A correct source compiles without output, and its database contains what the source says. Its size and checksum are
+correct. A second compilation gives the same database: in another directory, with other settings of language and time
+zone, and with options n and d. Option s gives the result of support/reverse_cdb.py, and reversing that gives the
+first database again. cdef verify finds no error in either database, and the source that cdef source writes compiles
+to the same database.
 
-For a mutation: the status is 0 or 1.  If 1, there is a message and no output;
-if 0, no message, and the database keeps all that was said above but for what
-the source means, which nobody knows.
+A mutation compiles with status 0 or 1. If the status is 1, there is a message and no output. If it is 0, there is no
+message, and the database has all of the properties above, except that its expected contents are not known.
 
-A group is a test of its own.  Everything follows from the seeds, so that a
-failure names the seed that shows it:
-generate_sources.py DIRECTORY 1 SEED writes its source again.
+Each group is a test of its own. Everything follows from the seeds, and a failure names the seed that shows it:
+generate_sources.py DIRECTORY 1 SEED writes that source again.
 """
 
 import functools
@@ -71,7 +68,7 @@ def require(holds, *what):
 
 
 def is_whole(image, mark):
-    """Size and checksum are right, in a byte order."""
+    """Checks size and checksum, in a byte order."""
     require(len(image) >= 80 and len(image) % 4 == 0, "size", len(image))
     words = struct.unpack(f"{mark}{len(image) // 4}I", image)
     require(words[0] == len(image) - 4, "length", words[0], "in a file of", len(image))
@@ -79,7 +76,7 @@ def is_whole(image, mark):
 
 
 class Reading:
-    """What of a database the truth speaks of."""
+    """The parts of a database that the expected contents are compared with."""
 
     def __init__(self, image):
         self.image = image
@@ -112,12 +109,12 @@ class Reading:
 
 
 def same(what, found, expected):
-    """Two things that have to be equal."""
+    """Raises Problem unless two things are equal."""
     require(found == expected, what, "is", found, "and not", expected)
 
 
 def says_the_truth(image, truth, out):
-    """The database holds what the source says."""
+    """Compares the database with the expected contents of its source."""
     reading = Reading(image)
     same("class", reading.text(reading.strings, reading.at + 8), truth.name or out.partition(".cdef")[0].encode())
     same("version", reading.get(reading.at + 216, "I")[0], truth.version)
@@ -150,7 +147,7 @@ def may_misplace_a_range(text, arrays_count=True):
 
 
 def may_cut_attributes_short(text):
-    """A second class may have ended an attribute without valid values; that it has none no image tells either."""
+    """A second class may have ended an attribute without valid values; no image shows that it has none."""
     return text.count(b"ControlDefinition") > 1
 
 
@@ -204,7 +201,7 @@ class Batch:
         return {name: (int(status), message) for name, (status, message) in zip(names, answers)}
 
     def holds(self, name, *check):
-        """Notes a problem of a source and continues."""
+        """Records a problem of a source and continues."""
         try:
             check[0](*check[1:])
         except (Problem, struct.error, IndexError, ValueError) as problem:
@@ -213,7 +210,7 @@ class Batch:
     # -- properties --
 
     def same_again(self, names):
-        """Elsewhere, under other settings, with options that change nothing of the database."""
+        """Compiles in another place, under other settings, and with options that do not change the database."""
         level = lambda name: len(self.sources[name]) % 5
         options = lambda name: ("-n", "-d", str(level(name)))
         place = "second place/of another depth"
@@ -225,7 +222,7 @@ class Batch:
             self.holds(name, require, self.read(name, place) == self.read(name, "first"), "another database elsewhere")
 
     def turned(self, names):
-        """Option s, against the other statement of the reversal, both ways."""
+        """Compares option s with the second implementation of the reversal, in both directions."""
         answers = self.compile("turned", names, lambda name: ("-s",))
         for name in names:
             first, turned = self.read(name, "first"), self.read(name, "turned")
@@ -237,7 +234,7 @@ class Batch:
             self.holds(name, require, reverse_cdb.reverse(turned) == first, "turned twice, another database")
 
     def alone(self, names):
-        """The program itself, which starts afresh for each."""
+        """Runs the program itself, which starts a new process for each source."""
         for name in names:
             command = [self.programs.cdgen, f"../sources/{name}", f"{name}.cdef"]
             result = subprocess.run(
@@ -254,7 +251,7 @@ class Batch:
         )
 
     def sound(self, names):
-        """Verification finds no errors, in either order."""
+        """Checks that verification finds no errors in either order."""
         if not names:
             return
         files = [str(self.path(name, place)) for name in names for place in ("first", "turned")]
@@ -262,7 +259,7 @@ class Batch:
         self.holds("cdef verify", same, "outcome", (result.returncode, result.stdout + result.stderr), (0, b""))
 
     def back(self, names):
-        """The source that is made of a database gives the same database."""
+        """Checks that the source made from a database compiles to the same database."""
         script = 'for i; do "$CDEF" source "first/$i.cdef" >"back/$i" || echo "$i"; done'
         environment = self.environment({"CDEF": str(self.programs.cdef)})
         result = subprocess.run(
@@ -277,7 +274,7 @@ class Batch:
                 self.holds(name, same, "difference", (result.returncode, result.stdout + result.stderr), (0, b""))
 
     def check(self, compiled):
-        """What holds for every database."""
+        """Checks all properties of a database."""
         for name in compiled:
             self.holds(name, is_whole, self.read(name, "first"), MARK)
         self.same_again(compiled)
@@ -288,7 +285,7 @@ class Batch:
 
 
 def check_mutation(batch, name, answer):
-    """A mutation compiles, or is refused properly."""
+    """Checks that a mutation either compiles or is refused properly."""
     status, message = answer
     batch.holds(name, require, status in (0, 1), "status", status)
     batch.holds(name, require, (status == 0) == (message == ""), "status", status, "with the message", message)
@@ -325,7 +322,7 @@ def check_group(programs, seeds):
 
 
 class Catalogue:
-    """Stanzas, attributes of each, and words of each of these that has a value of certain words."""
+    """The stanzas, their attributes, and the words that an attribute with certain words takes."""
 
     # Whose table the properties of a stanza are in.
     TABLES = {
@@ -375,7 +372,7 @@ class Catalogue:
 
     @staticmethod
     def used_in(text):
-        """What a source has of it, and words of other values."""
+        """The parts of the language that a source uses, and the words in other values."""
         used, stanza = set(), None
         for line in text.split("\n"):
             word = re.split("[ \t]", line)[0]
@@ -390,7 +387,7 @@ class Catalogue:
 
 
 def check_catalogue(programs):
-    """Whatever the language has comes up in the first sources, where it belongs."""
+    """Checks that the first sources use everything that the language has, where it belongs."""
     listing = subprocess.run([programs.list_names], capture_output=True, text=True, check=True).stdout
     known = Catalogue(listing).all()
     refused = set().union(*Catalogue.REFUSED.values())
@@ -403,7 +400,7 @@ def check_catalogue(programs):
 
 
 def check_determined(seeds):
-    """A seed gives the same source each time, and another seed another."""
+    """Checks that a seed always gives the same source, and that another seed gives another."""
     texts = [generate_sources.source(seed)[0] for seed in seeds]
     again = [generate_sources.source(seed)[0] for seed in seeds]
     problems = [] if texts == again else ["another source the second time"]
@@ -423,12 +420,12 @@ def seeds_of(group):
 
 @pytest.mark.slow(3)
 def test_catalogue():
-    """Whatever the language has comes up in the first sources, where it belongs."""
+    """The first sources use everything that the language has, where it belongs."""
     none(check_catalogue(PROGRAMS))
 
 
 def test_determined():
-    """A seed gives the same source each time, and another seed another."""
+    """The same seed always gives the same source, and another seed another."""
     none(check_determined(range(len(seeds_of(0)))))
 
 

@@ -1,7 +1,7 @@
-"""Tell the JSON of `cdef dump` as its listing, by what docs/dump.md says of both.
+"""Convert the JSON of `cdef dump` to its listing, following the description of both in docs/dump.md.
 
-The listings of the cases were written by hand; if the JSON, told this way, is
-the same text, it states the same facts in the same order.
+The listings of the cases were written by hand. If the conversion gives the same text, the JSON has the same facts in
+the same order.
 """
 
 import unicodedata

@@ -1,10 +1,9 @@
-"""Random class definition sources, careless ones among them.
+"""Random class definition sources, including careless ones.
 
-Every source follows from its seed.  Most compile; some do not, where texts or
-numbers come together badly.  What the language allows is written on purpose in
-unusual ways: kinds mixed, stanzas cut short by a second class, ranges that take
-effect elsewhere, runs that are replaced, end the file or lack indices, names
-and numbers used twice, texts full of quotes and comment characters.
+Every source follows from its seed. Most sources compile; some do not, because texts or numbers do not go together.
+The sources deliberately use the language in unusual ways: they mix kinds, let a second class cut stanzas short, and
+contain ranges that take effect elsewhere, runs that are replaced, that end the file or that lack indices, names and
+numbers that are used twice, and texts full of quotes and comment characters.
 """
 
 import random

@@ -1,9 +1,8 @@
-"""Random sources that are right, and mutations of them that mostly are not.
+"""Random sources that are correct, and mutations of them, most of which are not.
 
-source(seed) is a source that compiles, together with what its database must
-say of it; every stanza kind, attribute, data type, property and permission
-letter comes up.  mutation(seed, text) is a text with a few things changed
-at random.  Both follow from the seed alone.
+source(seed) is a source that compiles, together with the expected contents of its database. The sources contain
+every stanza kind, attribute, data type, property and permission letter. mutation(seed, text) is a text with a few
+random changes. Both follow from the seed alone.
 
 Run as a program, it writes sources: generate_sources.py DIRECTORY COUNT [SEED].
 """

@@ -1,35 +1,30 @@
-"""Make the images that the reader's tests look into, in both byte orders.
+"""Make the images for the reader's tests, in both byte orders.
 
-Nothing of the compiler or of the reader takes part: the images are described by
-hand (NAME.image, in the notation of cdb_image.py), and where there is something
-wrong with one, the description of what (broken/NAME.broken) names a sound image
-and the one thing that is changed in it.  Written are NAME.little.cdef and
-NAME.big.cdef, and the same below broken/.
+This does not use the compiler or the reader. The images are described by hand (NAME.image, in the notation of
+cdb_image.py). The description of a broken image (broken/NAME.broken) names a sound image and the changes to it. The
+results are NAME.little.cdef and NAME.big.cdef, and the same in broken/.
 
-Besides the items of cdb_image.py a description may hold
+In addition to the items of cdb_image.py, a description may contain
 
     section 7                     a section of any type, by its number
-    u16 N ..., u32 N ...          numbers as they stand, no padding
-    zeros N                       as many zero bytes
-    text "text"                   text with its NUL, no padding
+    u16 N ..., u32 N ...          numbers without padding
+    zeros N                       this number of zero bytes
+    text "text"                   a text with its NUL, without padding
 
-A broken image has 'key: value' lines; '//' starts a comment:
+A broken image has 'key: value' lines; '//' begins a comment:
 
     base: NAME                    the sound image
-    put: u8|u16|u32|cell AT VALUE a number written over what stands at AT; a
-                                  cell is TYPE:VALUE
-    hex: AT BYTES                 bytes written over, the same in both orders
-    cut: SIZE                     the file ends there
-    append: BYTES                 and there is more behind it
-    keep: length|checksum         do not work it out again: it is the thing
-    order: native                 for the tests: only a machine's own order
-    finding...:                   for the tests, which compare it with what the
-                                  reader says
+    put: u8|u16|u32|cell AT VALUE writes a number at the offset AT; a cell is TYPE:VALUE
+    hex: AT BYTES                 writes bytes, the same in both orders
+    cut: SIZE                     cuts the file to this size
+    append: BYTES                 appends bytes
+    keep: length|checksum         does not correct the length or the checksum, because the case is about it
+    order: native                 for the tests: only this machine's byte order
+    finding...:                   for the tests, which compare it with the reader's findings
 
-What a file's length and checksum should be is worked out after the change.
+Length and checksum are corrected after the changes.
 
-The worked example of docs/format.md, byte by byte, is an image too: document;
-document.rows says what stands where in it.
+The worked example of docs/format.md is an image too, byte by byte: document. document.rows lists its fields.
 """
 
 import argparse

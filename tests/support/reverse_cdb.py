@@ -1,12 +1,10 @@
 """Reverse the byte order of a finished database, field by field.
 
-A second, small statement of the reversal rules, used to check what the
-compiler's option -s writes: reading the native file and turning it here must
-give the same bytes.  References are followed while everything is still native;
-a list, a definition or a value reached twice is turned once; a reference that
-does not lead into its own table, whole and on a multiple of four, is not
-followed, and neither is a value cell that nothing has filled, nor
-an element of an array that is a bound.
+This is a second, small implementation of the rules of reversal, with which tests compare the compiler's option -s:
+reading the native file and reversing it here must give the same bytes. References are followed before anything is
+reversed. A list, a definition or a value that is reached twice is reversed once. These are not followed: a reference
+to an object that is not completely inside its table or not at a multiple of four, a value cell that was never
+filled, and an element of an array that is a bound.
 """
 
 import struct

@@ -1,7 +1,7 @@
-"""Sources written untidily: other blanks, comments and empty lines, which mean nothing to the compiler.
+"""Sources with an untidy layout: other blanks, comments and empty lines, which have no meaning to the compiler.
 
-untidy(seed, source) is a source that compiles to the same database; it follows from the seed. comments(source) are the
-comments of a source. Both take lines apart by themselves, without the formatter that they test.
+untidy(seed, source) is a source that compiles to the same database and follows from the seed. comments(source) are
+the comments of a source. Both split lines themselves, without the formatter that they test.
 """
 
 import random

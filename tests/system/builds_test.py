@@ -1,8 +1,8 @@
-"""Faults of the system, signals and other builds: whatever happens to `cdef build`, its target is the old database or
-the new one, whole, at most the one temporary file is left, and the next build removes it.
+"""Test `cdef build` under faults of the system, signals and other builds. Whatever happens, its target is either the
+complete old database or the complete new one. At most one temporary file is left, which the next build removes.
 
-Every test is a function below, named for what it shows. script/proof runs them with --cases=20000, which gives each
-its full number of times.
+Every test is a function below, named for what it shows. script/proof runs them with --cases=20000, so that each
+makes its full number of attempts.
 """
 
 import os

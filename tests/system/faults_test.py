@@ -1,11 +1,10 @@
-"""Test what the programs do when files fail. Every test is a function below, named for what it shows.
+"""Test what the programs do when files fail.
 
-Every test is a function below, named for what it shows.  Whatever happens, the
-program ends with a status of its own, never by a signal; and a fault before
-the output is opened leaves the output as it was.
+Every test is a function below, named for what it shows. Whatever happens, the program ends with an exit status,
+never by a signal, and a fault before the output is opened leaves the output unchanged.
 
-Run as root, cases about permissions give the program another user's.  A case
-that the machine does not allow (mounting) is skipped and says why.
+If the tests run as root, cases about permissions run the program as another user. A case that the machine does not
+allow (mounting a file system) is skipped with the reason.
 """
 
 import errno

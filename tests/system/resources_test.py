@@ -1,10 +1,9 @@
-"""Memory and streams that fail cdgen.
+"""Test cdgen with too little memory and with streams that fail.
 
-Every test is a function below, named for what it shows.  In whatever memory
-the program starts, it ends with a database or with the message and the status
-of memory that ran out; and a stream that cannot be written to changes nothing
-but what is seen.  A case that the machine does not allow (limiting the memory
-of a sanitizer) is skipped and says why.
+Every test is a function below, named for what it shows. If there is enough memory for the program to start, it ends
+either with a database or with the message and the status for lack of memory. If a stream cannot be written to, only
+its text is lost. A case that the machine does not allow (limiting the memory of a sanitizer) is skipped with the
+reason.
 """
 
 import errno

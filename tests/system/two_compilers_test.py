@@ -1,8 +1,7 @@
-"""Two compilers on one output: the file is always the whole database of one of them.
+"""Test two compilers that write the same output: the file is always the complete database of one of them.
 
-The first compiler is stopped just after one system call on the output, the
-second runs meanwhile, and then the first continues; support/traced.py does that.
-Then many pairs run freely.
+The first compiler is stopped just after one system call on the output, then the second one runs, and then the first
+one continues; support/traced.py does that. Finally, many pairs run at the same time without being stopped.
 """
 
 import os

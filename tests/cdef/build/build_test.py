@@ -1,7 +1,7 @@
-"""Test what `cdef build` makes of which sources, what it says, and which requests it refuses.
+"""Test `cdef build`: which databases it makes from which sources, what it reports, and which requests it refuses.
 
-Every test is a function, named for what it shows. What it does when the system fails it, tests/system/builds_test.py
-shows, and that it makes what cdgen makes, tests/property/build_same_test.py.
+Every test is a function, named for what it shows. tests/system/builds_test.py tests faults of the system, and
+tests/property/build_same_test.py compares the databases with those of cdgen.
 """
 
 import json

@@ -1,7 +1,7 @@
-"""Test that Make and Ninja understand what `cdef build --depfile` writes, whatever names files have.
+"""Test that Make and Ninja understand what `cdef build --depfile` writes, whatever the names of the files are.
 
-The rule of a build system names a database and knows nothing of its source; only the dependencies do. So a touched
-source makes the database anew, exactly once, if and only if the dependencies are understood.
+The rule of the build system in these tests does not name the source. So only if the dependencies are understood does
+a change of the source's time rebuild the database, and then exactly once.
 """
 
 import os

@@ -1,18 +1,16 @@
-"""Compares databases with cdef diff: what it prints, and which differences it calls compatible.
+"""Test cdef diff: its output for pairs of databases, and which differences it calls compatible.
 
-A case is a file below tests/cdef/diff in the notation of expectation.py, of
-these blocks:
+A case is a file in tests/cdef/diff in the notation of expectation.py, with these blocks:
 
-    replace:    lines of base.cdefsrc, which stand there once
-    with:       what stands there in the second source; no lines remove them
-    diff:       what cdef diff says of the two; nothing if they are the same
-    compat:     what cdef diff --compat says of them
-    clients:    what cdef diff --compat=clients says of them, if the case is about that
-    stored:     what cdef diff --compat=stored says of them, likewise
+    replace:    lines that occur once in base.cdefsrc
+    with:       the lines that replace them in the second source; none removes them
+    diff:       the output of cdef diff for both databases; empty if they are the same
+    compat:     the output of cdef diff --compat
+    clients:    the output of cdef diff --compat=clients, if the case is about this level
+    stored:     the output of cdef diff --compat=stored, if the case is about this level
 
-replace and with may come several times.  Each comparison runs in all four combinations of
-byte orders, and cdef diff the other way round too, where all that is new and
-all that is gone change places.
+There may be several pairs of replace and with. Each comparison runs in all four combinations of byte orders. cdef
+diff also runs in the reverse direction, in which added and removed objects change places.
 
 Everything else is a test in this file.
 """

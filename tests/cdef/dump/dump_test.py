@@ -1,17 +1,17 @@
-"""Check `cdef dump`: listings, JSON, annotated bytes.
+"""Test `cdef dump`: listings, JSON, annotated bytes.
 
-The cases of tests/cdef/dump are
+The cases in tests/cdef/dump are
 
-    listing/NAME    the listing of NAME.cdefsrc (or NAME.image, in the notation
-                    of cdb_image.py) is NAME.txt, in both byte orders but for
-                    the line that tells the order
-    facts/NAME      the JSON of the same, told as a listing, is NAME.txt too
+    listing/NAME    the listing of NAME.cdefsrc (or NAME.image, in the notation of cdb_image.py) is NAME.txt, in both
+                    byte orders, except for the line with the byte order
+    facts/NAME      the JSON of the same database, converted to a listing, is NAME.txt too
     json/NAME       the JSON of listing/NAME is NAME.json
     offsets/NAME    with --offsets, the listing is NAME.txt
     hex/NAME        the annotated bytes of listing/NAME are NAME.txt
-    regions/NAME    they are the file's, every byte once, whole or damaged
+    regions/NAME    the annotated bytes contain every byte of the file once, whether it is damaged or not
 
-The others are functions below.  A source is compiled to out.cdef; examples/NAME.cdefsrc serves where there is none beside.
+The other tests are functions below. A source is compiled to out.cdef. If a case has no source, it uses
+examples/NAME.cdefsrc.
 """
 
 import json

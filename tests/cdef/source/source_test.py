@@ -1,14 +1,12 @@
 """Test cdef source: what its sources look like, and that they compile to the same database.
 
-A case is tests/cdef/source/NAME.cdefsrc, which is compiled, or NAME.image, a
-database described as cdb_image.py says; and beside it NAME.expect, in the
-notation of expectation.py: the status (default 0), and as stdout: the source
-that is expected, or as stderr: the message of one that is refused.
+A case is tests/cdef/source/NAME.cdefsrc, which is compiled, or NAME.image, a database in the notation of
+cdb_image.py. Beside it, NAME.expect has the expected result in the notation of expectation.py: the status (default
+0), and the expected source as stdout: or the message of a refusal as stderr:.
 
-Besides, whatever compiles must come back: the source of a database compiles to
-one that cdef diff calls identical, and the source of that one is the same
-source.  cdef format leaves it as it is.  That holds for every golden source,
-the twins, the examples, and for generated sources, in both byte orders.
+In addition, the source of a database must compile to a database that cdef diff calls identical; the source of that
+database must be the same source, and cdef format must not change it. This is tested with every golden source, the
+twins, the examples, and generated sources, in both byte orders.
 """
 
 import os

@@ -57,7 +57,7 @@ TEST(Action, OpensAsEmptyRecord) {
     }
 }
 
-/* Deliberate: the resource kind's message speaks of the other one. */
+/* Deliberate: the resource kind's message names the other kind. */
 TEST(Action, NeedsAClass) {
     for (const action_row &kind : KINDS)
         for (auto step : {kind.init, kind.complete}) {

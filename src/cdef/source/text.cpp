@@ -7,6 +7,8 @@
 #include "text/hex.h"
 #include "text/number.h"
 
+#include <algorithm>
+#include <array>
 #include <cmath>
 
 namespace cdef::source {
@@ -39,8 +41,13 @@ bool is_all_text(std::string_view line) {
     return !line.ends_with(' ') && !line.ends_with('\t') && !line.ends_with('#');
 }
 
+bool is_blank(char c) {
+    return c == ' ' || c == '\t';
+}
+
+/* text: not empty */
 bool begins_with_quote(std::string_view text) {
-    std::size_t first = text.find_first_not_of(BLANKS);
+    std::size_t first = is_blank(text.front()) ? text.find_first_not_of(BLANKS) : 0;
     return first != std::string_view::npos && text[first] == '"';
 }
 
@@ -121,25 +128,23 @@ bool is_empty_handle(const cdb::value &v) {
 bool append_attribute_line(std::string &to, std::string_view name, std::string_view value) {
     if (value.empty())
         return false;
-    std::size_t start = to.size();
-    to += '\t';
-    to.append(name) += '=';
-    std::size_t after_name = to.size();
-    auto fits = [&] {
-        return to.size() - start <= LINE_MAX_CHARS && is_all_text(std::string_view(to).substr(after_name));
-    };
-    to.append(value);
-    bool is_written = !begins_with_quote(value) && fits();
-    if (!is_written) {
-        to.resize(after_name);
-        to.append("\"").append(value).append("\"");
-        is_written = !value.ends_with('\\') && fits();
-    }
-    if (!is_written)
-        to.resize(start);
-    else
-        to += '\n';
-    return is_written;
+    bool is_plain = !begins_with_quote(value) && is_all_text(value);
+    bool is_quoted = !is_plain && !value.ends_with('\\') && is_all_text("\"" + std::string(value) + "\"");
+    std::size_t size = 1 + name.size() + 1 + value.size() + (is_plain ? 0 : 2);
+    if ((!is_plain && !is_quoted) || size > LINE_MAX_CHARS)
+        return false;
+    std::array<char, LINE_MAX_CHARS + 1> line;
+    char *end = line.data();
+    auto add = [&end](std::string_view text) { end = std::copy(text.begin(), text.end(), end); };
+    *end++ = '\t';
+    add(name);
+    *end++ = '=';
+    add(is_plain ? "" : "\"");
+    add(value);
+    add(is_plain ? "" : "\"");
+    *end++ = '\n';
+    to.append(line.data(), end);
+    return true;
 }
 
 std::vector<std::string> texts_of(const cdb::value &value, bool in_pair) {

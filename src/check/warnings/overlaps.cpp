@@ -74,7 +74,7 @@ private:
                                                             : (single ? "value" : "range of values");
         finding &about =
             report(see, see.value_place(),
-                   same ? "this " + what + " is given already" : "this " + what + " overlaps with an earlier one",
+                   same ? "this " + what + " has already been given" : "this " + what + " overlaps with an earlier one",
                    {{earlier.line, 0, 0}, "the earlier one"});
         advise(about, same ? "remove one of the lines" : "give each value once");
     }

@@ -8,6 +8,7 @@
 #include "text/shown.h"
 
 #include <optional>
+#include <vector>
 
 namespace cdef::source {
 
@@ -29,16 +30,31 @@ std::optional<std::uint32_t> constant_in(const cdb::field_fact &fact) {
     return fact.always.value_or(0);
 }
 
-/* Checks that every field that no line fills has the value that the compiler gives it. */
-template <class Record> void require_plain(const Record &record, const record_name &place) {
-    const auto *bytes = reinterpret_cast<const std::byte *>(&record);
+/* A field that has the same value in every file. */
+struct constant_field {
+    const cdb::field *field;
+    std::uint32_t value;
+};
+
+template <class Record> std::vector<constant_field> find_constants() {
+    std::vector<constant_field> found;
     for (const cdb::field &f : cdb::fields_of<Record>) {
         if (f.kind != cdb::field_kind::number && f.kind != cdb::field_kind::reference)
             continue;
-        std::optional<std::uint32_t> expected = constant_in(cdb::format_for<Record>.fact_of(f));
-        std::uint32_t found = number_at(bytes + f.offset, f.width);
-        if (expected && found != *expected)
-            no_source(place, "no line sets " + std::string(f.name) + " to " + std::to_string(found));
+        if (std::optional<std::uint32_t> value = constant_in(cdb::format_for<Record>.fact_of(f)))
+            found.push_back({&f, *value});
+    }
+    return found;
+}
+
+/* Checks that every field that no line fills has the value that the compiler gives it. */
+template <class Record> void require_plain(const Record &record, const record_name &place) {
+    static const std::vector<constant_field> constants = find_constants<Record>();
+    const auto *bytes = reinterpret_cast<const std::byte *>(&record);
+    for (const constant_field &constant : constants) {
+        std::uint32_t found = number_at(bytes + constant.field->offset, constant.field->width);
+        if (found != constant.value)
+            no_source(place, "no line sets " + std::string(constant.field->name) + " to " + std::to_string(found));
     }
 }
 

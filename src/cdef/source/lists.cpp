@@ -15,6 +15,10 @@ bool is_same(const cdb::value &a, const cdb::value &b) {
         return a.text() == b.text();
     if (a.type() == VX_BINARY_PTR)
         return std::equal(a.binary().begin(), a.binary().end(), b.binary().begin(), b.binary().end());
+    if (a.type() == VX_INT32 || a.type() == VX_INT64)
+        return a.integer() == b.integer();
+    if (a.type() == VX_UINT32 || a.type() == VX_UINT64)
+        return a.natural() == b.natural();
     return texts_of(a, true) == texts_of(b, true);
 }
 

@@ -149,9 +149,8 @@ int build_or_refuse(const build_options &options) {
 }
 
 std::vector<std::string> names_of_orders() {
-    std::vector<std::string> names;
-    for (const auto &[name, order] : byte_orders)
-        names.push_back(name);
+    std::vector<std::string> names(byte_orders.size());
+    std::transform(byte_orders.begin(), byte_orders.end(), names.begin(), [](const auto &each) { return each.first; });
     return names;
 }
 

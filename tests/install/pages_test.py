@@ -71,7 +71,7 @@ class Options(unittest.TestCase):
             self.assertEqual(said[subcommand] | {"-h", "--help"}, options(subcommand), subcommand)
 
     def test_names_of_warnings(self):
-        said = self.page("cdef").split("explains, are\n")[1].split(".It ")[0]
+        said = self.page("cdef").split("The names are\n")[1].split(".It ")[0]
         codes = {value for value in values("check")["--warn"] if re.fullmatch(r"S\d+", value)}
         self.assertEqual(set(re.findall(r"^\.Cm (\S+)", said, re.M)) | {"all"}, values("check")["--warn"] - codes)
         accepted = [word for name in values("check")["--warn"] for word in ("--warn", name)]

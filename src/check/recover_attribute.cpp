@@ -246,8 +246,8 @@ void recovery::recover_index(bool consequence) {
     bool read = given.read == see.value().size() && given.value == compiler.element_index();
     bool awaited = consequence && !index_lost && compiler.element_index() == awaited_index;
     if (!awaited)
-        compiler.expect_index(read ? compiler.element_index() + 1 : expected + 1);
-    other_index = consequence ? -1 : expected + 1;
+        compiler.expect_index(index_after(read ? compiler.element_index() : expected));
+    other_index = consequence ? -1 : index_after(expected);
     awaited_index = consequence ? -1 : expected;
     index_lost = false;
 }

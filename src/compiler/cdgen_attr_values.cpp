@@ -339,7 +339,7 @@ void check_sd_index(const attr_line &line) {
                     cx.sd.expected_index());
         source_error(cx, MSG_INDEX_NOT_CONSECUTIVE);
     }
-    cx.sd.expect_index(static_cast<int>(static_cast<unsigned>(cx.sd.index()) + 1));
+    cx.sd.expect_index(index_after(cx.sd.index()));
 }
 
 /* Deliberate: an unknown type is not an error here. */

@@ -26,6 +26,12 @@ struct sd_element_state {
     int sd_vv_found = 0;
 };
 
+/* The index of the element after the one with this index. The largest int is followed by the smallest, so that every index
+ * has a next one. */
+constexpr int index_after(int index) {
+    return static_cast<int>(static_cast<unsigned>(index) + 1);
+}
+
 /* The owner of a run of elements. */
 enum class sd_run_state {
     NO_OWNER,     /* nobody yet: the owner is looked up when a run begins */

@@ -26,8 +26,8 @@ struct sd_element_state {
     int sd_vv_found = 0;
 };
 
-/* The index of the element after the one with this index. The largest int is followed by the smallest, so that every index
- * has a next one. */
+/* The index of the element after the one with this index. The largest int is followed by the smallest, so that every
+ * index has a next one. */
 constexpr int index_after(int index) {
     return static_cast<int>(static_cast<unsigned>(index) + 1);
 }

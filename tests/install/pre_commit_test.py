@@ -68,6 +68,17 @@ class Hooks(Case):
         self.assertEqual(status, 1, said)
         self.assertIn("Id 1 -> 77 (readers know it by its number) [CMP102]", said)
 
+    def test_stop_a_commit_in_a_linked_worktree(self):
+        run("pre-commit", "install", cwd=self.project, env=self.environment)
+        linked = self.here / "linked"
+        self.git(self.project, "worktree", "add", "-q", linked)
+        self.source = linked / self.source.name
+        self.change(b"Id=1\n", b"Id=77\n")
+        done = subprocess.run(["git", "commit", "-qam", "a change"], cwd=linked, env=self.environment, text=True,
+                              stdout=subprocess.PIPE, stderr=subprocess.STDOUT, check=False)
+        self.assertNotEqual(done.returncode, 0, done.stdout)
+        self.assertIn("Id 1 -> 77 (readers know it by its number) [CMP102]", done.stdout)
+
 
 if __name__ == "__main__":
     unittest.main()

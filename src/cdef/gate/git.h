@@ -8,8 +8,9 @@
 
 namespace cdef::gate_command {
 
-/* Standard output of git with these arguments, in a directory; nothing if its exit status is not 0. Its messages are
- * not shown. Throws failure if git cannot be run. */
+/* Standard output of git with these arguments, in a directory and for the repository that contains it, whatever
+ * repository the environment names; nothing if its exit status is not 0. Its messages are not shown. Throws failure if
+ * git cannot be run. */
 std::optional<std::string> git(const std::string &directory, const std::vector<std::string> &arguments);
 
 } // namespace cdef::gate_command

@@ -165,10 +165,10 @@ def test_looks_for_the_file_in_a_directory(world):
         world.path(f"old/{name}").unlink()
 
 
-def git(world, *arguments):
+def git(world, *arguments, cwd=None):
     """Runs git independently of the user's settings."""
     who = {f"GIT_{role}_{what}": "someone@example.com" for role in ("AUTHOR", "COMMITTER") for what in ("NAME", "EMAIL")}
-    subprocess.run(["git", *arguments], cwd=world.path("."), check=True, stdout=subprocess.DEVNULL,
+    subprocess.run(["git", *arguments], cwd=cwd or world.path("."), check=True, stdout=subprocess.DEVNULL,
                    env={**os.environ, **who, "GIT_CONFIG_GLOBAL": "/dev/null", "GIT_CONFIG_NOSYSTEM": "1"})
 
 
@@ -188,6 +188,43 @@ def test_takes_older_versions_from_git(world):
     git(world, "commit", "-qam", "new")
     expect(world.inspect("gate", "--against=git:HEAD", "classes/a.cdefsrc"), 0)
     check(codes(found(world, "--against=git:HEAD~1", "a.cdefsrc", cwd=world.path("classes"))[1]) == {"CMP102"}, "elsewhere")
+
+
+def test_finds_the_repository_of_the_class_whatever_git_has_set(world):
+    """Git sets GIT_DIR for hooks and aliases, and in a linked worktree also without them."""
+    old, new = with_class(ATTRIBUTE.format("Size", 1, "Int32")), with_class(ATTRIBUTE.format("Size", 2, "Int32"))
+    write(world, "r/classes/a.cdefsrc", old)
+    write(world, "r/classes/other/b.cdefsrc", with_class().replace("Name=Disk", "Name=New").replace("mgr1.cat", "b.cat"))
+    repository = world.path("r")
+    git(world, "init", "-q", ".", cwd=repository)
+    git(world, "add", "-A", cwd=repository)
+    git(world, "commit", "-qm", "old", cwd=repository)
+    git(world, "worktree", "add", "-q", "../w", cwd=repository)
+    git(world, "init", "-q", "elsewhere")
+    for place, inside in (("r", ".git"), ("w", "../r/.git/worktrees/w"), ("r", "../elsewhere/.git")):
+        write(world, f"{place}/classes/a.cdefsrc", new)
+        where = world.path(place)
+        environment = {**os.environ, "GIT_DIR": str((where / inside).resolve()), "GIT_WORK_TREE": str(where)}
+        for operand in ("classes/a.cdefsrc", "classes"):
+            status, findings = found(world, "--against=git:HEAD", operand, cwd=where, env=environment)
+            check((status, codes(findings)) == (1, {"CMP102"}), inside, operand, findings)
+
+
+def test_stops_a_commit_as_a_hook(world):
+    """In a linked worktree, where git names the repository to hooks."""
+    write(world, "r/classes/a.cdefsrc", with_class(ATTRIBUTE.format("Size", 1, "Int32")))
+    write(world, "r/.git-hooks/pre-commit", f"#!/bin/sh\nexec '{world.cdef}' gate --against=git:HEAD classes/a.cdefsrc\n")
+    world.path("r/.git-hooks/pre-commit").chmod(0o755)
+    git(world, "init", "-q", "r")
+    git(world, "add", "-A", cwd=world.path("r"))
+    git(world, "commit", "-qm", "old", cwd=world.path("r"))
+    git(world, "worktree", "add", "-q", "../w", cwd=world.path("r"))
+    commit = ("-c", "core.hooksPath=.git-hooks", "commit", "-qam", "new")
+    write(world, "w/classes/a.cdefsrc", with_class(ATTRIBUTE.format("Size", 2, "Int32")))
+    with pytest.raises(subprocess.CalledProcessError):
+        git(world, *commit, cwd=world.path("w"))
+    write(world, "w/classes/a.cdefsrc", with_class(ATTRIBUTE.format("Size", 1, "Int32")) + "# a comment\n")
+    git(world, *commit, cwd=world.path("w"))
 
 
 # ---- Classes that are gone -------------------------------------------------------------------------------------------

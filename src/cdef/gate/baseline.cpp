@@ -3,7 +3,7 @@
 #include "cdef/gate/baseline.h"
 
 #include "cdb_view.h"
-#include "cdef/gate/git.h"
+#include "cdef/gate/revision.h"
 #include "cdef/support/failure.h"
 
 #include <algorithm>
@@ -40,11 +40,6 @@ std::string without(std::string name, std::string_view end) {
     return name;
 }
 
-/* The output of git without its newline. */
-std::string line_of(std::string output) {
-    return without(std::move(output), "\n");
-}
-
 std::string without_dots(const fs::path &path) {
     return path.lexically_normal().string();
 }
@@ -71,16 +66,6 @@ std::vector<std::string> files_in(const std::string &directory) {
     return names;
 }
 
-/* Texts that git has put a zero byte after. */
-std::vector<std::string> texts_in(std::string_view output) {
-    std::vector<std::string> texts;
-    for (std::size_t end = output.find('\0'); end != output.npos; end = output.find('\0')) {
-        texts.emplace_back(output.substr(0, end));
-        output.remove_prefix(end + 1);
-    }
-    return texts;
-}
-
 /* The names, without directory, that an older version of a file may have, the likeliest one first. */
 std::vector<std::string> names_of(const std::string &path) {
     std::string own = fs::path(path).filename().string();
@@ -95,9 +80,9 @@ baseline::baseline(std::string wanted) : kind(kinds::FILE), place(std::move(want
         std::string rest = place.substr(GIT.size());
         std::size_t colon = rest.find(':');
         kind = colon == std::string::npos ? kinds::REVISION : kinds::REVISION_PATH;
-        revision = rest.substr(0, colon);
+        revision_name = rest.substr(0, colon);
         place = colon == std::string::npos ? "" : rest.substr(colon + 1);
-        if (revision.empty() || revision.starts_with('-'))
+        if (revision_name.empty() || revision_name.starts_with('-'))
             throw failure("--against git:" + rest + ": not a revision");
         return;
     }
@@ -123,41 +108,40 @@ std::optional<older_version> baseline::in_directory(const std::string &path) con
     return std::nullopt;
 }
 
+std::string baseline::name_in_revision(const std::string &path) const {
+    return std::string(GIT) + revision_name + ":" + path;
+}
+
 std::optional<older_version> baseline::in_revision(const std::string &path) const {
-    std::string directory = fs::path(path).parent_path().string();
-    if (!git(directory, {"rev-parse", "--verify", "--quiet", revision + "^{tree}"}))
-        throw failure(path + ": no git repository has it, or its repository has no revision " + revision);
-    std::vector<std::string> candidates;
+    revision at(revision_name, fs::path(path).parent_path().string(), path);
+    std::vector<std::string> candidates = {place};
+    std::optional<revision::entry> named;
     if (kind == kinds::REVISION) {
-        candidates.push_back("./" + fs::path(path).filename().string());
-    } else if (line_of(git(directory, {"cat-file", "-t", revision + ":" + place}).value_or("")) == "tree") {
-        for (const std::string &name : names_of(path))
-            candidates.push_back(place + (place.empty() || place.ends_with('/') ? "" : "/") + name);
-    } else {
-        candidates.push_back(place);
+        candidates = {"./" + fs::path(path).filename().string()};
+    } else if (named = at.find(place); named && named->is_directory) {
+        candidates = names_of(path);
+        for (std::string &each : candidates)
+            each.insert(0, within_place());
+    } else if (!named) {
+        throw failure(name_in_revision(place) + ": no such file or directory at that revision");
     }
     for (const std::string &each : candidates)
-        if (std::optional<std::string> text = git(directory, {"cat-file", "blob", revision + ":" + each}))
-            return older_version{GIT.data() + revision + ":" + each, bytes_of(*text)};
-    if (kind == kinds::REVISION_PATH && candidates.front() == place)
-        throw failure("git:" + revision + ":" + place + ": no such file or directory at that revision");
+        if (auto file = at.find(each); file && !file->is_directory)
+            return older_version{name_in_revision(each), bytes_of(at.contents_of(*file, each))};
     return std::nullopt;
 }
 
 /* Below the directory, with a slash; for a path at a revision or another directory, directly in that. */
 std::vector<std::string> baseline::names_for(const std::string &directory) const {
-    switch (kind) {
-    case kinds::FILE:
+    if (kind == kinds::FILE)
         return {};
-    case kinds::DIRECTORY:
+    if (kind == kinds::DIRECTORY)
         return files_in(place);
-    case kinds::REVISION:
-        return texts_in(git(directory, {"ls-tree", "-z", "-r", "--name-only", revision}).value_or(""));
-    case kinds::REVISION_PATH: /* git fails if that is a file */
-        return texts_in(
-            git(directory, {"ls-tree", "-z", "--name-only", "--full-tree", revision + ":" + place}).value_or(""));
-    }
-    return {};
+    revision at(revision_name, directory, directory);
+    if (kind == kinds::REVISION)
+        return at.names_below();
+    std::optional<revision::entry> named = at.find(place);
+    return named && named->is_directory ? at.names_in(*named, place) : std::vector<std::string>();
 }
 
 older_file baseline::older_file_of(const std::string &name, const std::string &directory) const {
@@ -167,10 +151,7 @@ older_file baseline::older_file_of(const std::string &name, const std::string &d
         std::string file = (fs::path(place) / name).string();
         return {file, file, key, directory};
     }
-    std::string beginning = kind == kinds::REVISION                 ? "./"
-                            : place.empty() || place.ends_with('/') ? place
-                                                                    : place + "/";
-    return {GIT.data() + revision + ":" + beginning + name, now, key, directory};
+    return {name_in_revision((kind == kinds::REVISION ? "./" : within_place()) + name), now, key, directory};
 }
 
 std::set<std::string> baseline::keys_of(const std::string &path) const {
@@ -199,10 +180,12 @@ std::vector<older_file> baseline::files_for(const std::string &directory,
 older_version baseline::read(const older_file &file) const {
     if (kind == kinds::DIRECTORY)
         return version_in(file.name);
-    std::optional<std::string> text = git(file.directory, {"cat-file", "blob", file.name.substr(GIT.size())});
-    if (!text)
+    std::string path = file.name.substr(name_in_revision("").size());
+    revision at(revision_name, file.directory, file.name);
+    auto found = at.find(path);
+    if (!found || found->is_directory)
         throw failure(file.name + ": not a file");
-    return {file.name, bytes_of(*text)};
+    return {file.name, bytes_of(at.contents_of(*found, path))};
 }
 
 } // namespace cdef::gate_command

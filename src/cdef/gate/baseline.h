@@ -52,14 +52,21 @@ private:
     std::optional<older_version> in_revision(const std::string &path) const;
     std::vector<std::string> names_for(const std::string &directory) const;
     older_file older_file_of(const std::string &name, const std::string &directory) const;
+    /* A path at the revision, as messages name it. */
+    std::string name_in_revision(const std::string &path) const;
+    /* The path at the revision, ready for a name in it. */
+    std::string within_place() const {
+        return place.empty() || place.ends_with('/') ? place : place + "/";
+    }
     /* True if the path at the revision begins at the directory of each class. */
     bool is_relative() const {
-        return kind == kinds::REVISION_PATH && (place == "." || place.starts_with("./"));
+        return kind == kinds::REVISION_PATH &&
+               (place == "." || place == ".." || place.starts_with("./") || place.starts_with("../"));
     }
 
     kinds kind;
-    std::string place;    /* the file, the directory, or the path at the revision */
-    std::string revision; /* empty: none */
+    std::string place;         /* the file, the directory, or the path at the revision */
+    std::string revision_name; /* empty: none */
 };
 
 } // namespace cdef::gate_command

@@ -227,6 +227,64 @@ def test_stops_a_commit_as_a_hook(world):
     git(world, *commit, cwd=world.path("w"))
 
 
+def committed(world, place, files):
+    """A repository with these files, or links to (...,), in its last commit."""
+    for name, text in files.items():
+        if isinstance(text, tuple):
+            world.path(f"{place}/{name}").parent.mkdir(parents=True, exist_ok=True)
+            world.path(f"{place}/{name}").symlink_to(text[0])
+        else:
+            write(world, f"{place}/{name}", text)
+    for arguments in (("init", "-q", "."), ("add", "-A"), ("commit", "-qm", "old")):
+        git(world, *arguments, cwd=world.path(place))
+
+
+def test_refuses_an_older_version_that_git_cannot_read(world):
+    """It does not mistake it for a new class. Damaged file, listing, and a clone whose server is gone."""
+    old = with_class(ATTRIBUTE.format("Size", 1, "Int32"))
+    committed(world, "r", {"classes/a.cdefsrc": old, "c/b.cdefsrc": with_class()})
+    git(world, "config", "uploadpack.allowFilter", "true", cwd=world.path("r"))
+    git(world, "clone", "-q", "--filter=blob:none", "--no-checkout", f"file://{world.path('r')}", "clone")
+    for place in ("r", "clone"):
+        write(world, f"{place}/classes/a.cdefsrc", old.replace("Id=1", "Id=2"))
+    for kind, revision in (("blob", "HEAD:classes/a.cdefsrc"), ("tree", "HEAD:classes")):
+        name = subprocess.run(["git", "rev-parse", revision], cwd=world.path("r"), check=True, stdout=subprocess.PIPE,
+                              text=True).stdout.strip()
+        world.path(f"r/.git/objects/{name[:2]}/{name[2:]}").rename(world.path("gone"))
+        for against, path in (("git:HEAD", "./a.cdefsrc"), ("git:HEAD:classes/a.cdefsrc", "classes/a.cdefsrc")):
+            for place in ("r", "clone") if kind == "blob" else ("r",):
+                world.path("r").rename(world.path("moved")) if place == "clone" else None
+                expect(world.inspect("gate", "--against", against, "classes/a.cdefsrc", cwd=world.path(place)), 2,
+                       f"cdef: git:HEAD:{path}: git cannot read it\n".encode())
+                world.path("moved").rename(world.path("r")) if place == "clone" else None
+        for against, path in (("git:HEAD", "./"), ("git:HEAD:classes", "classes")) if kind == "tree" else ():
+            expect(world.inspect("gate", "--against", against, "classes", cwd=world.path("r")), 2,
+                   f"cdef: git:HEAD:{path}: git cannot read it\n".encode())
+        world.path("gone").rename(world.path(f"r/.git/objects/{name[:2]}/{name[2:]}"))
+
+
+def test_follows_links_at_a_revision(world):
+    """Of files and of directories, as the system does; not out of the repository."""
+    old, new = with_class(ATTRIBUTE.format("Size", 1, "Int32")), with_class(ATTRIBUTE.format("Size", 2, "Int32"))
+    committed(world, "r", {"shared/real.cdefsrc": old, "classes/second.cdefsrc": ("../shared/real.cdefsrc",),
+                           "classes/a.cdefsrc": ("second.cdefsrc",), "linked": ("shared",), "out.cdefsrc": ("../x",),
+                           "absolute.cdefsrc": ("/x",), "dangling.cdefsrc": ("x",), "circle.cdefsrc": ("circle.cdefsrc",)})
+    write(world, "r/shared/real.cdefsrc", new)
+    repository = world.path("r")
+    for against, operand in (("git:HEAD", "classes/a.cdefsrc"), ("git:HEAD", "linked/real.cdefsrc"),
+                             ("git:HEAD:linked", "shared/real.cdefsrc"), ("git:HEAD:linked/", "shared")):
+        status, findings = found(world, "--against", against, operand, cwd=repository)
+        check((status, codes(findings)) == (1, {"CMP102"}), against, operand, findings)
+    for name, why in (("out", "a symbolic link that leads out of the repository"),
+                      ("absolute", "a symbolic link that leads out of the repository"),
+                      ("dangling", "a symbolic link that leads nowhere at that revision"),
+                      ("circle", "too many symbolic links")):
+        world.path(f"r/{name}.cdefsrc").unlink()
+        write(world, f"r/{name}.cdefsrc", new)
+        expect(world.inspect("gate", "--against=git:HEAD", f"{name}.cdefsrc", cwd=repository), 2,
+               f"cdef: git:HEAD:./{name}.cdefsrc: {why}\n".encode())
+
+
 # ---- Classes that are gone -------------------------------------------------------------------------------------------
 
 A, B = (HEAD.replace(b"Name=Disk", name).replace(b"mgr1.cat", cat) for name, cat in

@@ -192,6 +192,18 @@ def test_signals_end_many_builds_at_once_cleanly(world):
         check(not list(world.directory.glob(".*.cdef-new")), "left behind")
 
 
+@pytest.mark.parametrize("failing", ["1", "1+", "2", "2+", "3", "3+"])
+def test_builds_with_the_threads_that_can_be_started(world, failing):
+    """The first thread waits for signals; the others build. Without any, the program itself builds."""
+    names = [f"{number}.cdefsrc" for number in range(6)]
+    for name in names:
+        world.write(name, HEAD.replace(b"Name=Disk", b"Name=Disk" + name[:1].encode()))
+    status, stderr = ended(traced(world, ["-f", "-e", f"inject=clone3,clone:error=EAGAIN:when={failing}"], "build", "-q",
+                                  "-j4", "-d", "made", *names))
+    check(status == 0 and stderr == b"", status, stderr)
+    check(len(list(world.path("made").iterdir())) == len(names), "not all")
+
+
 def test_file_size_limit(world):
     """Exceeding the limit is reported as an error."""
     old, new = two_databases(world)

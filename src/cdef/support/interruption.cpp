@@ -70,7 +70,12 @@ interruption_watch::interruption_watch() : watched(ending_signals()), before() {
     sigaddset(&watched, SIGUSR2); /* ends the watch, too */
     pthread_sigmask(SIG_BLOCK, &watched, &before);
     watch_is_over = false;
-    watcher = std::thread([this] { watch(); });
+    try {
+        watcher = std::thread([this] { watch(); });
+    } catch (...) {
+        pthread_sigmask(SIG_SETMASK, &before, nullptr);
+        throw;
+    }
 }
 
 interruption_watch::~interruption_watch() {

@@ -25,6 +25,7 @@ private:
  * signal. (Otherwise the signal would be delivered to a thread that happens not to hold it back.) */
 class interruption_watch {
 public:
+    /* Throws std::system_error if the thread cannot be started. */
     interruption_watch();
     interruption_watch(const interruption_watch &) = delete;
     interruption_watch &operator=(const interruption_watch &) = delete;

@@ -3,6 +3,7 @@
 #include "cdef/build/build.h"
 
 #include "build/dependencies.h"
+#include "cdef/build/separate.h"
 #include "cdef/build/workers.h"
 #include "cdef/cdef.h"
 #include "cdef/support/command.h"
@@ -82,7 +83,8 @@ assignment assignment_of(const build_options &options) {
     project_files projects(options.findings.project);
     std::vector<build::request> requests;
     assignment all;
-    for (const std::string &source : sources_of(options.operands)) {
+    std::vector<std::string> sources = sources_of(options.operands);
+    for (const std::string &source : options.file ? sources : build_command::without_repetitions(sources)) {
         const config::settings &settings = projects.of(source);
         requests.push_back({source, naming_of(options, settings), settings.path});
         all.rules.push_back(options.findings.rules(settings));
@@ -90,6 +92,7 @@ assignment assignment_of(const build_options &options) {
             all.directories.insert(*directory);
     }
     all.units = build::plan_of(requests);
+    build_command::require_separate_files(all.units, options.depfile);
     return all;
 }
 

@@ -347,6 +347,45 @@ def test_refuses(world, arguments, message):
     check(files(world) == before, files(world))
 
 
+@pytest.mark.parametrize("arguments, message", [
+    (("--depfile", SOURCE, SOURCE), b"class.cdefsrc: cannot write: it is the source class.cdefsrc"),
+    (("--depfile", "class.cdef", SOURCE), b"class.cdef: cannot write dependencies: it is a database"),
+    (("--depfile", "here/class.cdef", SOURCE), b"here/class.cdef: cannot write dependencies: it is a database"),
+    (("-o", "cdef.toml", SOURCE), b"cdef.toml: cannot write: it is the project file cdef.toml"),
+    (("--depfile", "cdef.toml", SOURCE), b"cdef.toml: cannot write: it is the project file cdef.toml"),
+    (("-j1", "-d", "p", "a/Disk.cdefsrc", "p/Disk.cdef"), b"p/Disk.cdef: cannot write: it is the source p/Disk.cdef"),
+    (("-d", "p", "a/Disk.cdefsrc", "here/hard"), b"p/Disk.cdef: cannot write: it is the source here/hard"),
+    (("one/x.cdefsrc", "two/x.cdefsrc"), b"two/../here/out/x.cdef: it would be built from one/x.cdefsrc and from two/x.cdefsrc"),
+    (("--list", "one/x.cdefsrc", "two/x.cdefsrc"),
+     b"two/../here/out/x.cdef: it would be built from one/x.cdefsrc and from two/x.cdefsrc"),
+])
+def test_writes_to_no_file_that_it_reads_and_to_none_twice(world, arguments, message):
+    """Whatever the files' names are."""
+    sources(world, "a/Disk.cdefsrc", "p/Disk.cdef", "one/x.cdefsrc", "two/x.cdefsrc")
+    world.path("hard").hardlink_to(world.path("p/Disk.cdef"))
+    world.path("here").symlink_to(".")
+    for name, text in (("cdef.toml", ""), ("one/cdef.toml", "[build]\ndirectory = '../out'\n"),
+                       ("two/cdef.toml", "[build]\ndirectory = '../here/out'\n")):
+        world.write(name, text.encode())
+    before = {name: world.read(name) for name in files(world)}
+    expect(build(world, *arguments), 2, b"cdef: " + message + b"\n")
+    check({name: world.read(name) for name in files(world)} == before, files(world))
+
+
+def test_builds_a_source_once_however_often_it_is_given(world):
+    """But under each of its names, and replaces databases that have several names."""
+    sources(world, "classes/a.cdefsrc", "classes/b.cdefsrc")
+    world.path("linked").symlink_to("classes")
+    said = b"cdef: 2 databases: 2 written, 0 unchanged, 0 not made\n"
+    expect(build(world, "classes", "classes/a.cdefsrc", world.path("classes/b.cdefsrc"), "linked"), 0, said)
+    world.path("classes/b.cdef").unlink()
+    world.path("classes/b.cdef").hardlink_to(world.path("classes/a.cdef"))
+    expect(build(world, "classes"), 0, said.replace(b"2 written, 0", b"1 written, 1"))
+    world.path("classes/b.cdefsrc").unlink()
+    world.path("classes/b.cdefsrc").symlink_to("a.cdefsrc")
+    check(build(world, "-d", "both", "classes").returncode == 0 and len(files(world, "both")) == 2, files(world))
+
+
 def test_takes_names_as_they_are(world):
     """Even names that the command line's library would change."""
     for name in ("[a,b]", "a b", "-o", "\xe4\n"):

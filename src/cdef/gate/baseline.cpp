@@ -70,7 +70,14 @@ std::vector<std::string> files_in(const std::string &directory) {
 std::vector<std::string> names_of(const std::string &path) {
     std::string own = fs::path(path).filename().string();
     std::string stem = without(without(own, "src"), ".cdef");
-    return {stem + ".cdef", stem + ".le.cdef", stem + ".be.cdef", stem + ".cdefsrc", own};
+    std::vector<std::string> names = {stem + ".cdef", stem + ".le.cdef", stem + ".be.cdef", stem + ".cdefsrc", own};
+    for (std::string_view order : {".le", ".be"})
+        if (own.ends_with(std::string(order) + ".cdef")) {
+            std::string base = without(stem, order);
+            for (std::string_view end : {".cdef", ".le.cdef", ".be.cdef", ".cdefsrc"})
+                names.push_back(base + std::string(end));
+        }
+    return names;
 }
 
 } // namespace

@@ -165,6 +165,20 @@ def test_looks_for_the_file_in_a_directory(world):
         world.path(f"old/{name}").unlink()
 
 
+def test_finds_the_older_version_of_a_database_of_one_byte_order(world):
+    """In a directory of databases that have plain names or those of the other byte order."""
+    write(world, "old.cdefsrc", with_class(ATTRIBUTE.format("Size", 1, "Int32")))
+    write(world, "Disk.cdefsrc", with_class(ATTRIBUTE.format("Size", 2, "Int32")))
+    expect(world.inspect("build", "-q", "--byte-order=both", "-d", "new", "Disk.cdefsrc"), 0)
+    for name in ("Disk.cdef", "Disk.be.cdef"):
+        world.path("old").mkdir()
+        expect(world.inspect("build", "-q", "-o", f"old/{name}", "old.cdefsrc"), 0)
+        for database in ("new/Disk.le.cdef", "new/Disk.be.cdef"):
+            check(codes(found(world, "--against=old", database)[1]) == {"CMP102"}, name, database)
+        world.path(f"old/{name}").unlink()
+        world.path("old").rmdir()
+
+
 def git(world, *arguments, cwd=None):
     """Runs git independently of the user's settings."""
     who = {f"GIT_{role}_{what}": "someone@example.com" for role in ("AUTHOR", "COMMITTER") for what in ("NAME", "EMAIL")}

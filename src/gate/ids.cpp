@@ -203,6 +203,8 @@ id_record::key id_record::key_of(const numbered &of) {
 }
 
 void id_record::add(std::string_view line, std::size_t line_number) {
+    if (line.ends_with('\r')) /* in a name, it is written as \r */
+        throw wrong_ids(std::to_string(line_number) + ": the line ends with a carriage return before the newline");
     if (line.empty() || line.starts_with('#'))
         return;
     std::optional<numbered> read = numbered_in(line);

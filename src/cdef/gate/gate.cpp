@@ -103,8 +103,10 @@ private:
     void look_at(const operand &what, report::writer &form);
     void report_former(report::writer &form);
     check::totals judge(const operand &what, report::writer &form);
-    std::vector<check::finding> breaches(const operand &what, const version &now, const version *before,
-                                         std::string_view source) const;
+    static std::vector<gate::numbered> numbers_of(const operand &what, const std::string &named_after,
+                                                  const version &now, std::string_view source);
+    std::vector<check::finding> breaches(const operand &what, const std::string &named_after, const version &now,
+                                         const version *before, std::string_view source) const;
 
     const gate_options &options;
     project_files projects;
@@ -118,12 +120,16 @@ private:
 
 const baseline *gate_run::baseline_for(const config::settings &settings) {
     std::string wanted = options.against.value_or(settings.baseline);
+    if (options.against && wanted.empty())
+        throw failure("--against: expected a file, a directory, or git:REVISION");
     return wanted.empty() ? nullptr : &baselines.try_emplace(wanted, wanted).first->second;
 }
 
 /* The default file need not exist, but one that is named must. */
 ids_file *gate_run::ids_for(const std::string &source, const config::settings &settings) {
     std::string path = options.ids.value_or(settings.ids);
+    if (options.ids && path.empty())
+        throw failure("--ids: expected a file");
     bool may_be_missing = options.update || path.empty();
     if (path.empty())
         path = default_ids(source, settings);
@@ -162,20 +168,29 @@ void gate_run::look_for_former(const std::vector<operand> &all) {
         former.look_for(*where.second, where.first, there, paths);
 }
 
+/* A class without a name is recorded under that of its file, not under the name that an older version has given it. */
+std::vector<gate::numbered> gate_run::numbers_of(const operand &what, const std::string &named_after,
+                                                 const version &now, std::string_view source) {
+    std::string own = stem_of(what.path);
+    if (source.empty() || named_after == own)
+        return gate::numbers_of(now.in.db);
+    version again(what.path, gate::compile(source, what.path, own).image);
+    return gate::numbers_of(again.in.db);
+}
+
 /* What breaks, in the order of the lines. */
-std::vector<check::finding> gate_run::breaches(const operand &what, const version &now, const version *before,
-                                               std::string_view source) const {
+std::vector<check::finding> gate_run::breaches(const operand &what, const std::string &named_after, const version &now,
+                                               const version *before, std::string_view source) const {
     std::string level = options.level.value_or(what.settings.level.empty() ? "readers" : what.settings.level);
     std::vector<check::finding> found;
     if (before != nullptr)
         found = gate::judge({before->origin(), now.origin(), source}, level_called(level));
-    std::vector<gate::numbered> numbers = gate::numbers_of(now.in.db);
-    if (options.update) {
-        what.ids->accept(numbers);
-    } else if (what.ids->exists()) {
-        std::vector<check::finding> more = what.ids->record().judge(numbers, gate::source_places(source));
-        found.insert(found.end(), std::make_move_iterator(more.begin()), std::make_move_iterator(more.end()));
-    }
+    std::vector<check::finding> more;
+    if (options.update)
+        more = what.ids->accept(numbers_of(what, named_after, now, source), gate::source_places(source));
+    else if (what.ids->exists())
+        more = what.ids->record().judge(numbers_of(what, named_after, now, source), gate::source_places(source));
+    found.insert(found.end(), std::make_move_iterator(more.begin()), std::make_move_iterator(more.end()));
     std::stable_sort(found.begin(), found.end(),
                      [](const check::finding &a, const check::finding &b) { return a.at.line < b.at.line; });
     return found;
@@ -185,10 +200,11 @@ check::totals gate_run::judge(const operand &what, report::writer &form) {
     std::optional<older_version> old = what.against == nullptr ? std::nullopt : what.against->version_of(what.path);
     std::unique_ptr<version> before = old ? readable(std::move(*old)) : nullptr;
     std::string source = text_of_file(what.path);
+    std::string named_after = class_name_for(what.path, before.get());
     std::vector<std::byte> image = bytes_of(source);
     std::vector<check::finding> found;
     if (is_text(image) || image.empty()) {
-        gate::compiled made = gate::compile(source, what.path, class_name_for(what.path, before.get()));
+        gate::compiled made = gate::compile(source, what.path, named_after);
         image = std::move(made.image);
         found = std::move(made.findings);
     } else {
@@ -199,7 +215,7 @@ check::totals gate_run::judge(const operand &what, report::writer &form) {
         for (std::string &name : now.class_names())
             classes.insert(std::move(name));
         bool is_new = what.against != nullptr && before == nullptr;
-        found = breaches(what, now, is_new ? former.last_of(*what.against, now) : before.get(), source);
+        found = breaches(what, named_after, now, is_new ? former.last_of(*what.against, now) : before.get(), source);
     }
     check::totals count;
     for (const check::finding &each : found) {

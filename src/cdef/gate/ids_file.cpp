@@ -6,6 +6,7 @@
 #include "cdef/support/replacement.h"
 #include "cdef/support/text_of_file.h"
 
+#include <algorithm>
 #include <filesystem>
 #include <utility>
 
@@ -17,6 +18,10 @@ ids_file::ids_file(std::string name, bool may_be_missing) : path(std::move(name)
         is_there = false;
         return;
     }
+    /* A device may have no end. */
+    std::filesystem::file_status is = std::filesystem::status(path, error);
+    if (std::filesystem::exists(is) && !std::filesystem::is_regular_file(is) && !std::filesystem::is_fifo(is))
+        throw failure(path + ": not a regular file");
     before = text_of_file(path);
     try {
         recorded = gate::id_record(before);
@@ -25,9 +30,23 @@ ids_file::ids_file(std::string name, bool may_be_missing) : path(std::move(name)
     }
 }
 
+std::vector<check::finding> ids_file::accept(const std::vector<gate::numbered> &numbers,
+                                             const gate::source_places &places) {
+    std::vector<check::finding> found = accepted.judge(numbers, places);
+    found.erase(std::remove_if(found.begin(), found.end(), [](const check::finding &each) { return !each.error; }),
+                found.end());
+    if (found.empty()) {
+        accepted.accept(numbers);
+        recorded.accept(numbers);
+    }
+    return found;
+}
+
 void ids_file::save() const {
     if (std::string now = recorded.text(); now != before)
-        replace_file(path, now, {.before = is_there ? std::optional<std::string_view>(before) : std::nullopt});
+        replace_file(
+            path, now,
+            {.before = is_there ? std::optional<std::string_view>(before) : std::nullopt, .must_be_new = !is_there});
 }
 
 } // namespace cdef::gate_command

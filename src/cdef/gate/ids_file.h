@@ -5,6 +5,7 @@
 #include "gate/ids.h"
 
 #include <string>
+#include <vector>
 
 namespace cdef::gate_command {
 
@@ -20,10 +21,10 @@ public:
     const gate::id_record &record() const {
         return recorded;
     }
-    void accept(const std::vector<gate::numbered> &numbers) {
-        recorded.accept(numbers);
-    }
-    /* Replaces the file if it would change. */
+    /* Records the numbers of a class, unless they contradict a class that has been recorded by this object: returns
+     * how, as findings. */
+    std::vector<check::finding> accept(const std::vector<gate::numbered> &numbers, const gate::source_places &places);
+    /* Replaces the file if it would change. Throws failure if another program has changed or made it. */
     void save() const;
 
 private:
@@ -31,6 +32,7 @@ private:
     std::string before; /* its text as it was read */
     bool is_there;
     gate::id_record recorded;
+    gate::id_record accepted; /* by this object */
 };
 
 } // namespace cdef::gate_command

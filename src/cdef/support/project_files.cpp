@@ -17,6 +17,8 @@ void add_project_options(command &to, project_options &options) {
 const std::string &project_files::path_for(const std::string &source) {
     if (options.none)
         return paths[""];
+    if (options.file && options.file->empty())
+        throw failure("--config: expected a file");
     if (options.file)
         return *options.file;
     std::string directory = std::filesystem::path(source).parent_path().string() + "/";

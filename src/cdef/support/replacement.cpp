@@ -217,6 +217,8 @@ bool replaced_at_once(const std::string &target, std::string_view contents, cons
     temporary.fill(contents, old, options.sync);
     if (options.before)
         require_contents(target, *options.before);
+    if (options.must_be_new && existing(target))
+        throw failure("it has been made in the meantime");
     temporary.rename_to(target);
     return true;
 }

@@ -26,6 +26,7 @@ struct replacement_options {
     /* What a program has read from the file and changed. If the file has other contents by now, or may not be written
      * to, it is not replaced. */
     std::optional<std::string_view> before = {};
+    bool must_be_new = false; /* if there is a file by now, it is not replaced */
 };
 
 /* Replaces the file that a path leads to, or makes it. It keeps its mode and, if this user may give files away, its

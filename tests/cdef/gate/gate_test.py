@@ -510,6 +510,53 @@ def test_refuses_files_of_numbers_that_say_something_else(world):
     expect(world.inspect("gate", "a.cdefsrc"), 0)
 
 
+def test_records_a_nameless_class_under_the_name_of_its_file(world):
+    """Not under the name that its database has, which begins with a directory."""
+    nameless = with_class(ATTRIBUTE.format("Size", 1, "Int32")).replace("\tName=Disk\n", "")
+    write(world, "Disk.cdefsrc", nameless)
+    expect(world.inspect("build", "-q", "-o", "old/Disk.cdef", "--no-warn=all", "Disk.cdefsrc"), 2,
+           b"cdef: old/Disk.cdef: cannot write: No such file or directory\n")
+    world.path("old").mkdir()
+    check(world.inspect("build", "-q", "-o", "old/Disk.cdef", "Disk.cdefsrc").returncode == 0, "not built")
+    for against in ((), ("--against=old",)):
+        expect(world.inspect("gate", "--update", *against, "Disk.cdefsrc"), 0)
+        check(world.read("ids.lock").decode().split("\n")[1:] ==
+              ["Disk\tPersistentResourceAttribute\t1\tInt32\tSize", ""], against)
+
+
+def test_records_no_two_meanings_at_once(world):
+    """Two sources of one class, of which only one can be right."""
+    write(world, "a.cdefsrc", with_class(ATTRIBUTE.format("Size", 1, "Int32")))
+    write(world, "b.cdefsrc", with_class(ATTRIBUTE.format("Room", 1, "Int32")))
+    write(world, "c.cdefsrc", with_class(ATTRIBUTE.format("Size", 1, "Int32")))
+    status, findings = found(world, "--update", "a.cdefsrc", "b.cdefsrc", "c.cdefsrc")
+    check((status, [each["code"] for each in findings]) == (1, ["CMP401"]), findings)
+    check(world.read("ids.lock").decode().split("\n")[1:] ==
+          ["Disk\tPersistentResourceAttribute\t1\tInt32\tSize", ""], "recorded")
+
+
+def test_refuses_lines_that_end_with_a_carriage_return(world):
+    """With a reason."""
+    write(world, "a.cdefsrc", HEAD)
+    write(world, "ids.lock", "# comment\n\r\n")
+    expect(world.inspect("gate", "a.cdefsrc"), 2,
+           b"cdef: ids.lock:2: the line ends with a carriage return before the newline\n")
+
+
+@pytest.mark.parametrize("arguments, message", [
+    (("--update", "--ids=/dev/full"), b"/dev/full: not a regular file"),
+    (("--ids=/dev/zero",), b"/dev/zero: not a regular file"),
+    (("--against", ""), b"--against: expected a file, a directory, or git:REVISION"),
+    (("--ids", ""), b"--ids: expected a file"),
+    (("--config", ""), b"--config: expected a file"),
+])
+def test_refuses_names_of_no_file(world, arguments, message):
+    """Even if the numbers could be checked."""
+    write(world, "a.cdefsrc", HEAD)
+    write(world, "ids.lock", "")
+    expect(world.inspect("gate", *arguments, "a.cdefsrc"), 2, b"cdef: " + message + b"\n")
+
+
 # ---- Project files ---------------------------------------------------------------------------------------------------
 
 

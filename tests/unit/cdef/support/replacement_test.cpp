@@ -119,6 +119,15 @@ TEST_F(Replacement, ReplacesAFileThatHasNotChanged) {
     EXPECT_EQ(read("a.cdefsrc"), "new");
 }
 
+TEST_F(Replacement, LeavesAFileThatHasBeenMadeInTheMeantime) {
+    write("ids.lock", "old");
+    EXPECT_EQ(refusal("ids.lock", {.must_be_new = true}), "ids.lock: cannot write: it has been made in the meantime");
+    EXPECT_EQ(read("ids.lock"), "old");
+    EXPECT_EQ(files(), 1u);
+    replace_file(path("other"), "new", {.must_be_new = true});
+    EXPECT_EQ(read("other"), "new");
+}
+
 TEST_F(Replacement, LeavesAFileThatHasChangedInTheMeantime) {
     write("a.cdefsrc", "old");
     EXPECT_EQ(refusal("a.cdefsrc", {.before = "older"}),

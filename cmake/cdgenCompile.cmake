@@ -14,7 +14,7 @@
 #                 the current source directory. cdef.toml chooses the level, and the file of numbers, which is ids.lock
 #                 beside cdef.toml, or beside the source, if left out
 #
-# The database is built again when the source, its cdef.toml, ids.lock, the older version or cdef has changed. If the
+# The database is built again when the source, its cdef.toml or cdef has changed; GATE is checked in each build. If the
 # source has errors, the old database stays.
 
 # The project file that cdef finds for a source; empty if there is none.
@@ -67,32 +67,28 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
     list(APPEND options --werror)
   endif()
 
+  # The hash distinguishes names that are equal without characters that a target's name cannot have (a-b, a_b).
+  string(MD5 hash "${shown}")
+  string(SUBSTRING "${hash}" 0 8 hash)
+
   cdgen_project_file("${SOURCE}" project)
   set(depends ${project})
   set(gate "")
   if(DEFINED arg_GATE)
     if(NOT arg_GATE MATCHES "^git:")
       cmake_path(ABSOLUTE_PATH arg_GATE BASE_DIRECTORY "${CMAKE_CURRENT_SOURCE_DIR}" NORMALIZE)
-      list(APPEND depends "${arg_GATE}")
-    endif()
-    cmake_path(GET project PARENT_PATH beside)
-    if(NOT project)
-      cmake_path(GET SOURCE PARENT_PATH beside)
-    endif()
-    if(EXISTS "${beside}/ids.lock")
-      list(APPEND depends "${beside}/ids.lock")
     endif()
     set(strict "")
     if(arg_WERROR)
       set(strict --werror)
     endif()
-    set(gate COMMAND "${CMAKE_COMMAND}" -E chdir "${place}" "$<TARGET_FILE:cdgen::cdef>" gate "--against=${arg_GATE}"
-      ${strict} -- "${SOURCE}")
+    # A target, because it is run in each build: a build system cannot know when a revision, a directory of older
+    # versions or a file of numbers has changed.
+    set(gate "cdgen_gate_${hash}")
+    add_custom_target("${gate}"
+      COMMAND "$<TARGET_FILE:cdgen::cdef>" gate "--against=${arg_GATE}" ${strict} -- "${SOURCE}"
+      VERBATIM)
   endif()
-
-  # The hash distinguishes names that are equal without characters that a target's name cannot have (a-b, a_b).
-  string(MD5 hash "${shown}")
-  string(SUBSTRING "${hash}" 0 8 hash)
 
   # A database that comes out as it was keeps its time. Ninja looks at it again after the command if the command has
   # byproducts, and here a stamp is one. Other build systems go by times alone.
@@ -106,10 +102,9 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
   # A class without a Name is named after the output as given on the command line, which is the bare file name.
   add_custom_command(OUTPUT ${databases}
     COMMAND "${CMAKE_COMMAND}" -E make_directory "${place}"
-    ${gate}
     COMMAND "${CMAKE_COMMAND}" -E chdir "${place}" "$<TARGET_FILE:cdgen::cdef>" build ${options} -- "${SOURCE}"
     ${restat}
-    DEPENDS "${SOURCE}" ${depends} "$<TARGET_FILE:cdgen::cdef>"
+    DEPENDS "${SOURCE}" ${depends} ${gate} "$<TARGET_FILE:cdgen::cdef>"
     COMMENT "Building class definition ${shown}"
     VERBATIM)
 

@@ -142,6 +142,24 @@ class Compile:
         with self.assertRaises(AssertionError):
             self.build()
 
+    def test_gate_is_checked_in_each_build(self):
+        """A file in the directory of older versions and a file of numbers that did not exist are noticed."""
+        released = self.here / "released"
+        released.mkdir()
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef GATE released)", a=disk().read_bytes())
+        self.build()
+        self.assertNotIn("Building class definition", self.build())
+        (released / "a.cdefsrc").write_bytes(disk().read_bytes().replace(b"Id=1\n", b"Id=77\n"))
+        with self.assertRaises(AssertionError) as failed:
+            self.build()
+        self.assertIn("[CMP102]", str(failed.exception))
+        (released / "a.cdefsrc").unlink()
+        self.build()
+        (self.here / "ids.lock").write_text("Disk\tPersistentResourceAttribute\t1\tString\tOther\n")
+        with self.assertRaises(AssertionError) as failed:
+            self.build()
+        self.assertIn("[CMP401]", str(failed.exception))
+
     def test_project_file_builds_again(self):
         (self.here / "cdef.toml").write_text("")
         odd = disk().read_bytes().replace(b"Id=1\n", b"Id=010\n")

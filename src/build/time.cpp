@@ -20,15 +20,14 @@ orb_timeval32_t seconds_in(const std::string &text, const std::string &name, con
 } // namespace
 
 orb_timeval32_t time_of(const time_wishes &wishes, orb_timeval32_t now) {
-    if (wishes.forced_empty || wishes.option == "none")
-        return {0, 0};
+    orb_timeval32_t wanted = {0, 0};
     if (wishes.option == "now")
-        return now;
-    if (wishes.option)
-        return seconds_in(*wishes.option, "--timestamp", "none, now or seconds");
-    if (wishes.environment)
-        return seconds_in(*wishes.environment, "SOURCE_DATE_EPOCH", "seconds");
-    return {0, 0};
+        wanted = now;
+    else if (wishes.option && wishes.option != "none")
+        wanted = seconds_in(*wishes.option, "--timestamp", "none, now or seconds");
+    else if (!wishes.option && wishes.environment && !wishes.forced_empty)
+        wanted = seconds_in(*wishes.environment, "SOURCE_DATE_EPOCH", "seconds");
+    return wishes.forced_empty ? orb_timeval32_t{0, 0} : wanted;
 }
 
 } // namespace build

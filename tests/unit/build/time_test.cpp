@@ -43,6 +43,8 @@ TEST(Time, IsNoneWhateverElseIsAskedForIfThatIsForced) {
 }
 
 TEST(Time, HasToBeANumberOf32Bits) {
+    EXPECT_EQ(refusal({.option = "bad", .forced_empty = true}),
+              "--timestamp: 'bad' is not none, now or seconds from 0 to 4294967295");
     EXPECT_EQ(refusal({.option = "soon"}), "--timestamp: 'soon' is not none, now or seconds from 0 to 4294967295");
     EXPECT_EQ(refusal({.option = "-1"}), "--timestamp: '-1' is not none, now or seconds from 0 to 4294967295");
     EXPECT_EQ(refusal({.environment = "4294967296"}),

@@ -355,7 +355,8 @@ def test_refuses(world, arguments, message):
     (("--depfile", "cdef.toml", SOURCE), b"cdef.toml: cannot write: it is the project file cdef.toml"),
     (("-j1", "-d", "p", "a/Disk.cdefsrc", "p/Disk.cdef"), b"p/Disk.cdef: cannot write: it is the source p/Disk.cdef"),
     (("-d", "p", "a/Disk.cdefsrc", "here/hard"), b"p/Disk.cdef: cannot write: it is the source here/hard"),
-    (("one/x.cdefsrc", "two/x.cdefsrc"), b"two/../here/out/x.cdef: it would be built from one/x.cdefsrc and from two/x.cdefsrc"),
+    (("one/x.cdefsrc", "two/x.cdefsrc"),
+     b"two/../here/out/x.cdef: it would be built from one/x.cdefsrc and from two/x.cdefsrc"),
     (("--list", "one/x.cdefsrc", "two/x.cdefsrc"),
      b"two/../here/out/x.cdef: it would be built from one/x.cdefsrc and from two/x.cdefsrc"),
 ])

@@ -266,11 +266,13 @@ def test_refuses_an_older_version_that_git_cannot_read(world):
                               text=True).stdout.strip()
         world.path(f"r/.git/objects/{name[:2]}/{name[2:]}").rename(world.path("gone"))
         for against, path in (("git:HEAD", "./a.cdefsrc"), ("git:HEAD:classes/a.cdefsrc", "classes/a.cdefsrc")):
-            for place in ("r", "clone") if kind == "blob" else ("r",):
-                world.path("r").rename(world.path("moved")) if place == "clone" else None
-                expect(world.inspect("gate", "--against", against, "classes/a.cdefsrc", cwd=world.path(place)), 2,
-                       f"cdef: git:HEAD:{path}: git cannot read it\n".encode())
-                world.path("moved").rename(world.path("r")) if place == "clone" else None
+            refused = (2, f"cdef: git:HEAD:{path}: git cannot read it\n".encode())
+            arguments = ("gate", "--against", against, "classes/a.cdefsrc")
+            expect(world.inspect(*arguments, cwd=world.path("r")), *refused)
+            if kind == "blob":
+                world.path("r").rename(world.path("moved"))
+                expect(world.inspect(*arguments, cwd=world.path("clone")), *refused)
+                world.path("moved").rename(world.path("r"))
         for against, path in (("git:HEAD", "./"), ("git:HEAD:classes", "classes")) if kind == "tree" else ():
             expect(world.inspect("gate", "--against", against, "classes", cwd=world.path("r")), 2,
                    f"cdef: git:HEAD:{path}: git cannot read it\n".encode())

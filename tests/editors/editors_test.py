@@ -86,6 +86,21 @@ def test_neovim(place):
     same((place / "pump.cdefsrc").read_text(), AFTER, "source")
 
 
+def test_neovim_completes_the_header_of_a_stanza(place):
+    """Neovim 0.7 would insert the newlines of the required lines as zero bytes."""
+    nvim = Neovim(place)
+    try:
+        nvim.expect("luaeval('(vim.diagnostic.get(0)[1] or { message = \"\" }).message')", MESSAGE)
+        nvim.type("Go<C-u>ResourceV<C-x><C-o>")
+        nvim.expect("getline('$')", "ResourceVariableClass")
+        nvim.type("<C-y><Esc>:write<CR>:quitall!<CR>")
+        same(nvim.process.wait(WAIT), 0, "status")
+    finally:
+        nvim.process.kill()
+        nvim.process.wait()
+    same((place / "pump.cdefsrc").read_text(), BEFORE + "ResourceVariableClass\n", "source")
+
+
 def test_emacs(place):
     """Version 28 with eglot, by its commands."""
     command = ["emacs", "--batch", "--no-site-file", "-f", "package-initialize", "-l", PROJECT / "editors/emacs/cdef.el",

@@ -112,6 +112,14 @@ bool comes_before(const table_attrs &one, const table_attrs &other) {
     return rank(one) < rank(other);
 }
 
+std::vector<const table_attrs *> in_usual_order(const srtable_ctrl &kind) {
+    std::vector<const table_attrs *> all;
+    for (const table_attrs &attr : kind.sc_attrs)
+        all.push_back(&attr);
+    std::stable_sort(all.begin(), all.end(), [](const auto *a, const auto *b) { return comes_before(*a, *b); });
+    return all;
+}
+
 name_list missing_names(const srtable_ctrl &kind, vx_uint32_t seen) {
     name_list names;
     for (const table_attrs &attr : kind.sc_attrs)

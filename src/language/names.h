@@ -7,6 +7,7 @@
 
 #include <bitset>
 #include <string_view>
+#include <vector>
 
 namespace language {
 
@@ -31,6 +32,9 @@ name_list property_names(int attr_type);
  * bits, except that those that may be repeated are last. Optional ones are in the catalogue's order, except that a name
  * is first. */
 bool comes_before(const table_attrs &one, const table_attrs &other);
+
+/* The attributes of a kind in this order. */
+std::vector<const table_attrs *> in_usual_order(const srtable_ctrl &kind);
 
 /* The required attributes of a kind that are not in seen, a mask of their req_bits. */
 name_list missing_names(const srtable_ctrl &kind, vx_uint32_t seen);

@@ -177,23 +177,22 @@ bool takes_optional(const place_in_source &place) {
 void add_attributes(items &to, const place_in_source &place) {
     bool has_equals = place.attribute != nullptr && place.attribute->parts.has_equals;
     bool optional_too = takes_optional(place);
-    for (bool required : {true, false})
-        for (const table_attrs &each : place.stanza->row().sc_attrs) {
-            bool is_required = (each.req_bit & OPTIONAL) == 0;
-            bool fits = is_required || optional_too;
-            bool refused = each.ta_type == AT_SD_DEFAULT_VALUE;
-            bool again = is_given(place, each);
-            if (is_required != required || !fits || refused || (again && each.dup_allowed == 0))
-                continue;
-            bool numbered = each.ta_type == AT_ID || each.ta_type == AT_SD_INDEX;
-            std::string text = each.ta_name;
-            if (!has_equals)
-                text += "=";
-            if (!has_equals && numbered)
-                text += example_value(place.text(), place.in.index(), *place.stanza, each);
-            json &item = to.add(each.ta_name, PROPERTY, text, attribute_documentation(place.stanza->row(), each));
-            item["detail"] = is_required ? "required" : "optional";
-        }
+    for (const table_attrs *each : language::in_usual_order(place.stanza->row())) {
+        bool is_required = (each->req_bit & OPTIONAL) == 0;
+        bool fits = is_required || optional_too;
+        bool refused = each->ta_type == AT_SD_DEFAULT_VALUE;
+        bool again = is_given(place, *each);
+        if (!fits || refused || (again && each->dup_allowed == 0))
+            continue;
+        bool numbered = each->ta_type == AT_ID || each->ta_type == AT_SD_INDEX;
+        std::string text = each->ta_name;
+        if (!has_equals)
+            text += "=";
+        if (!has_equals && numbered)
+            text += example_value(place.text(), place.in.index(), *place.stanza, *each);
+        json &item = to.add(each->ta_name, PROPERTY, text, attribute_documentation(place.stanza->row(), *each));
+        item["detail"] = is_required ? "required" : "optional";
+    }
 }
 
 /* ---- Values ----------------------------------------------------------------------------------------------------- */

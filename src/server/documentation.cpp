@@ -5,6 +5,7 @@
 #include "format/names.h"
 #include "language/fields.h"
 #include "language/meanings.h"
+#include "language/names.h"
 #include "language/suggestions.h"
 #include "text/hex.h"
 
@@ -25,9 +26,9 @@ std::string point(std::string_view what, std::string_view text) {
 
 std::string names_of(const srtable_ctrl &kind, bool required) {
     language::name_list names;
-    for (const table_attrs &each : kind.sc_attrs)
-        if (is_required(each) == required)
-            names.push_back(each.ta_name);
+    for (const table_attrs *each : language::in_usual_order(kind))
+        if (is_required(*each) == required)
+            names.push_back(each->ta_name);
     return names.empty() ? std::string() : language::listed(names);
 }
 

@@ -2,6 +2,8 @@
 
 #include "server/examples.h"
 
+#include "language/names.h"
+
 namespace lsp {
 
 std::string example_value(std::string_view source, const source_index::index &of, const source_index::stanza &in,
@@ -33,9 +35,9 @@ std::string example_value(std::string_view source, const source_index::index &of
 std::vector<const table_attrs *> missing_in(const source_index::stanza &in) {
     std::vector<const table_attrs *> missing;
     vx_uint32_t seen = in.required_seen();
-    for (const table_attrs &each : in.row().sc_attrs)
-        if ((each.req_bit & OPTIONAL) == 0 && (seen & each.req_bit) == 0)
-            missing.push_back(&each);
+    for (const table_attrs *each : language::in_usual_order(in.row()))
+        if ((each->req_bit & OPTIONAL) == 0 && (seen & each->req_bit) == 0)
+            missing.push_back(each);
     return missing;
 }
 

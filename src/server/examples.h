@@ -14,7 +14,7 @@ namespace lsp {
 std::string example_value(std::string_view source, const source_index::index &of, const source_index::stanza &in,
                           const table_attrs &attr);
 
-/* The required attributes that a stanza lacks, in the order of the catalogue. */
+/* The required attributes that a stanza lacks, in their usual order. */
 std::vector<const table_attrs *> missing_in(const source_index::stanza &in);
 
 } // namespace lsp

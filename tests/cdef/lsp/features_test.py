@@ -226,6 +226,26 @@ def test_stanza_brings_its_required_lines_in_order(pump):
     assert "ClassToManagerMapping" not in labels(items) and "ControlDefinition" not in labels(items)
 
 
+@pytest.mark.parametrize("kind, lines", [
+    ("ResourceClass", "Description DisplayName Properties ClassPermTemplate ResourcePermTemplate"),
+    ("ResourceVariableClass", "VariableClass ObservationInterval ReportingInterval"),
+])
+def test_required_lines_are_in_their_usual_order(pump, kind, lines):
+    """In snippets and hovers, and where attributes are completed, the order is that of `cdef format --reorder`."""
+    names = lines.split()
+    head = PUMP[:PUMP.index("ResourceClass")]
+    _, taken = complete(pump, head + "|")
+    assert re.findall(r"\t(\w+)=", taken(kind)[len(head):]) == names
+    show(pump, head + kind)
+    text, _ = hover(pump, kind[:5] + "|" + kind[5:], head + kind)
+    assert re.findall(r"`(\w+)`", text[text.index("required"):text.index("optional")]) == names
+    assert labels(complete(pump, head + kind + "\n\t|")[0]) == names
+    text = head + kind + "\n"
+    show(pump, text)
+    (after,) = actions(pump, kind[:5] + "|" + kind[5:], text, only=["quickfix"])[0].values()
+    assert re.findall(r"\t(\w+)=", after[len(head):]) == names
+
+
 def test_stanza_of_a_client_without_snippets_compiles(directory):
     with Client(capabilities={}) as client:
         client.version = 1

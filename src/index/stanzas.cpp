@@ -66,6 +66,11 @@ int number_family(int kind) {
     }
 }
 
+bool shares_numbers(const stanza &one, const stanza &other) {
+    return &one != &other && one.class_number == other.class_number &&
+           number_family(one.kind) == number_family(other.kind);
+}
+
 /* Nothing for a text that is not a decimal number, or is too large for a record. */
 std::optional<long long> number_in(std::string_view text) {
     long long number = 0;
@@ -122,20 +127,25 @@ span index::extent_of(const stanza &of) const {
     return {lines[of.first_line].whole.begin, lines[of.last_line].whole.end};
 }
 
-/* An element's number is its index, which counts from 0 in its run. */
 std::optional<long long> index::next_id(std::string_view source, const stanza &of) const {
-    std::string_view name = of.is_element() ? "ElementIndex" : "Id";
-    if (!of.is_known() || find_attr(of.row(), name) == nullptr)
+    if (of.is_element())
+        return std::count_if(stanzas.begin(), stanzas.end(), [&](const stanza &each) {
+            return of.run != NONE && each.run == of.run && each.first_line < of.first_line;
+        });
+    if (!of.is_known() || find_attr(of.row(), "Id") == nullptr)
         return std::nullopt;
     long long highest = -1;
-    for (const stanza &each : stanzas) {
-        bool counts = of.is_element()
-                          ? each.run == of.run
-                          : each.class_number == of.class_number && number_family(each.kind) == number_family(of.kind);
-        if (counts && &each != &of)
-            highest = std::max(highest, number_in(each.value(source, name)).value_or(-1));
-    }
+    for (const stanza &each : stanzas)
+        if (shares_numbers(each, of))
+            highest = std::max(highest, number_in(each.value(source, "Id")).value_or(-1));
     return highest + 1;
+}
+
+bool index::is_free_id(std::string_view source, const stanza &of) const {
+    std::optional<long long> number = number_in(of.value(source, "Id"));
+    return number && std::none_of(stanzas.begin(), stanzas.end(), [&](const stanza &each) {
+               return shares_numbers(each, of) && number_in(each.value(source, "Id")) == number;
+           });
 }
 
 index index_of(std::string_view source) {

@@ -63,8 +63,10 @@ struct index {
     /* All of a stanza, from its header to the end of its last line. */
     span extent_of(const stanza &of) const;
     /* The number after the highest one in use by stanzas of this kind in the class. Persistent and dynamic attributes
-     * of a level share their numbers. */
+     * of a level share their numbers. An element's number is its place in its run, counted from 0. */
     std::optional<long long> next_id(std::string_view source, const stanza &of) const;
+    /* Whether a stanza's Id is a number that no other stanza has. */
+    bool is_free_id(std::string_view source, const stanza &of) const;
 };
 
 index index_of(std::string_view source);

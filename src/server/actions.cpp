@@ -56,9 +56,8 @@ private:
         all.push_back({{"title", title}, {"kind", kind}, {"edit", workspace_edit(now, in, std::move(edits))}});
         return all.back();
     }
-    json edit(const stretch &at, std::string_view by) const {
-        position_maker positions = in.positions(now.client.units);
-        return text_edit(positions, at, by);
+    json edit(const stretch &at, std::string by) const {
+        return byte_edit(in, now.client.units, at, std::move(by));
     }
     void add_corrections();
     void add_missing_lines();
@@ -107,6 +106,17 @@ void collector::add_corrections() {
     }
 }
 
+/* Whether a stanza may continue after what looks like a header: an attribute in column 1, or the rest of a line that
+ * the compiler reads in pieces. A missing attribute may be there. */
+bool may_continue(document &in, const source_index::stanza &of) {
+    const std::vector<source_index::stanza> &all = in.index().stanzas;
+    auto next = std::find_if(all.begin(), all.end(), [&](const auto &each) { return each.first_line > of.first_line; });
+    if (next == all.end() || next->is_known())
+        return false;
+    bool begins_line = in.text()[in.index().lines[next->first_line].whole.begin - 1] == '\n';
+    return !begins_line || next->header.of(in.text()).find('=') != std::string_view::npos;
+}
+
 /* The line after which missing lines are inserted: the last required one in front of all optional ones. */
 std::size_t line_before_missing(const source_index::stanza &of) {
     std::size_t line = of.first_line;
@@ -120,7 +130,7 @@ std::size_t line_before_missing(const source_index::stanza &of) {
 
 void collector::add_missing_lines() {
     place_in_source place = place_at(in, part.begin);
-    if (place.stanza == nullptr || !place.stanza->is_known())
+    if (place.stanza == nullptr || !place.stanza->is_known() || may_continue(in, *place.stanza))
         return;
     std::vector<const table_attrs *> missing = missing_in(*place.stanza);
     if (missing.empty())
@@ -131,7 +141,9 @@ void collector::add_missing_lines() {
         lines += "\n\t" + std::string(each->ta_name) + "=" + example_value(in.text(), in.index(), *place.stanza, *each);
         names.push_back(each->ta_name);
     }
-    std::size_t end = in.index().lines[line_before_missing(*place.stanza)].whole.end;
+    /* A long line has several in the index. */
+    std::size_t end = in.text().find('\n', in.index().lines[line_before_missing(*place.stanza)].whole.end);
+    end = std::min(end, in.text().size());
     add("Add " + language::listed(names), QUICK_FIX, json::array({edit({end, end}, lines)}));
 }
 
@@ -140,6 +152,8 @@ void collector::add_free_number() {
     bool numbered = place.has_known_attribute() && place.attribute->parts.has_equals &&
                     (place.attribute->known->ta_type == AT_ID || place.attribute->known->ta_type == AT_SD_INDEX);
     if (!numbered)
+        return;
+    if (!place.stanza->is_element() && in.index().is_free_id(in.text(), *place.stanza))
         return;
     std::string next = example_value(in.text(), in.index(), *place.stanza, *place.attribute->known);
     if (place.attribute->parts.value.of(in.text()) != next)
@@ -152,6 +166,8 @@ void collector::add_quotes() {
     if (place.attribute == nullptr || place.attribute->parts.quoted || place.attribute->parts.value.is_empty())
         return;
     std::string_view value = place.attribute->parts.value.of(in.text());
+    if (value.find_first_of("\"\r") != value.npos)
+        return; /* only the compiler knows where such a value would end */
     const source_index::line &line = in.index().lines[place.line];
     std::string quotes = "\"" + std::string(value) + "\"";
     std::string after = in.text().substr(line.whole.begin, place.attribute->parts.value.begin - line.whole.begin) +
@@ -187,7 +203,8 @@ void collector::add_all_corrections() {
     if (fixed.text == before)
         return;
     difference made = difference_of(before, fixed.text);
-    add("Correct all that is certain", FIX_ALL, json::array({edit(made.old_part, made.new_part.of(fixed.text))}));
+    add("Correct all that is certain", FIX_ALL,
+        json::array({edit(made.old_part, std::string(made.new_part.of(fixed.text)))}));
 }
 
 } // namespace

@@ -93,7 +93,9 @@ bool may_follow(const place_in_source &place, const srtable_ctrl &kind, const st
     if (before == nullptr || !before->is_known())
         return false;
     const sd_owner &who = *kind.sc_sd_owner;
-    if (who.of_class != nullptr || &before->row() == &kind)
+    if (&before->row() == &kind)
+        return missing_in(*before).empty();
+    if (who.of_class != nullptr)
         return true;
     if (who.of_action != nullptr)
         return before->kind == SC_CLASS_ACTION || before->kind == SC_RESOURCE_ACTION ||
@@ -103,16 +105,93 @@ bool may_follow(const place_in_source &place, const srtable_ctrl &kind, const st
     return structured && before->row().sc_attr != nullptr && persistent == (who.type == SD_TYPE_PATTR);
 }
 
+/* Whether a dynamic attribute of resources before the line has a Range, which one of the class after it would lose. */
+bool is_range_before(const place_in_source &place) {
+    const std::vector<stanza> &all = place.in.index().stanzas;
+    return std::any_of(all.begin(), all.end(), [&](const stanza &each) {
+        return each.kind == SC_DYNAMIC_RESOURCE_ATTRIBUTE && each.first_line < place.line &&
+               each.find("Range") != nullptr;
+    });
+}
+
+/* The reverse: whether a dynamic attribute of the class after the line has a Range. */
+bool is_range_after(const place_in_source &place) {
+    const std::vector<stanza> &all = place.in.index().stanzas;
+    return std::any_of(all.begin(), all.end(), [&](const stanza &each) {
+        return each.kind == SC_DYNAMIC_CLASS_ATTRIBUTE && each.first_line > place.line && each.find("Range") != nullptr;
+    });
+}
+
+/* Whether the source has a stanza of a kind, other than on the line. */
+bool is_in_source(const place_in_source &place, int kind) {
+    const std::vector<stanza> &all = place.in.index().stanzas;
+    return std::any_of(all.begin(), all.end(),
+                       [&](const stanza &each) { return each.kind == kind && each.first_line != place.line; });
+}
+
+/* The first stanza after the line. */
+const stanza *stanza_after(const place_in_source &place) {
+    const std::vector<stanza> &all = place.in.index().stanzas;
+    auto after = std::find_if(all.begin(), all.end(), [&](const stanza &each) { return each.first_line > place.line; });
+    return after == all.end() ? nullptr : &*after;
+}
+
+/* Whether attribute lines follow the line directly, so that a header on it would take them. */
+bool has_lines_below(const place_in_source &place) {
+    const stanza *of = place.stanza;
+    return of != nullptr && !of->attributes.empty() && of->attributes.back().line > place.line;
+}
+
+bool is_header(const place_in_source &place) {
+    return place.stanza != nullptr && place.stanza->first_line == place.line;
+}
+
+/* Whether a stanza of a kind may be between two others. A run of elements must not be divided, nor separated from what
+ * it describes. Elements of the class must not follow those of an attribute directly. */
+bool may_precede(const srtable_ctrl &kind, const stanza *before, const stanza *after) {
+    const sd_owner *who = kind.sc_sd_owner;
+    bool follows_attribute = before != nullptr && before->is_element() && before->row().sc_sd_owner->is_attribute();
+    if (who != nullptr && who->of_class != nullptr && follows_attribute)
+        return false;
+    if (after == nullptr || !after->is_element())
+        return true;
+    const sd_owner &next = *after->row().sc_sd_owner;
+    bool divides = before != nullptr && before->kind == after->kind;
+    if (&after->row() == &kind || divides)
+        return false;
+    if (next.of_class != nullptr)
+        return who == nullptr || who->of_class != nullptr;
+    return next.of_action != nullptr && who != nullptr && who->of_action != nullptr;
+}
+
+/* Whether all lines below the line are attributes of a kind. */
+bool takes_lines_below(const place_in_source &place, const srtable_ctrl &kind) {
+    const auto &lines = place.stanza->attributes;
+    return std::all_of(lines.begin(), lines.end(), [&](const source_index::attribute &each) {
+        return find_attr(kind, each.parts.name.of(place.text())) != nullptr;
+    });
+}
+
 bool may_begin(const place_in_source &place, int kind) {
     const srtable_ctrl &row = sc_tables[static_cast<std::size_t>(kind)];
+    if (is_header(place) && place.stanza->is_known() && has_lines_below(place))
+        return place.stanza->kind == kind;
+    if (has_lines_below(place) && (!is_header(place) || !takes_lines_below(place, row)))
+        return false;
+    if (!may_precede(row, stanza_before(place), stanza_after(place)))
+        return false;
     switch (kind) {
     case SC_CONTROL_DEFINITION:
     case SC_CLASS_TO_MANAGER_MAPPING:
     case SC_RESOURCE_CLASS:
-        return !is_kind_before(place, kind) &&
+        return !is_in_source(place, kind) &&
                (kind != SC_RESOURCE_CLASS || is_kind_before(place, SC_CONTROL_DEFINITION));
     case SC_RESOURCE_VARIABLE_CLASS:
         return true;
+    case SC_DYNAMIC_RESOURCE_ATTRIBUTE:
+        return is_kind_before(place, SC_CONTROL_DEFINITION) && !is_range_after(place);
+    case SC_DYNAMIC_CLASS_ATTRIBUTE:
+        return is_kind_before(place, SC_CONTROL_DEFINITION) && !is_range_before(place);
     default:
         return is_kind_before(place, SC_CONTROL_DEFINITION) &&
                (row.sc_sd_owner == nullptr || may_follow(place, row, stanza_before(place)));
@@ -134,6 +213,9 @@ std::string escaped(std::string_view text) {
 std::string stanza_text(const place_in_source &place, int kind, bool snippet) {
     stanza fresh;
     fresh.kind = kind;
+    fresh.first_line = place.line;
+    if (has_lines_below(place))
+        return fresh.row().sc_name;
     const stanza *before = stanza_before(place);
     fresh.class_number = before == nullptr ? 0 : before->class_number;
     if (fresh.is_element() && before != nullptr && before->kind == kind)
@@ -303,8 +385,11 @@ void add_by_type(items &to, const place_in_source &place, const stretch &part) {
     }
 }
 
-/* The part of the value that an item replaces: one item of a list, one word of an expression, or all of it. It ends at
- * the cursor. */
+bool is_in_name(char c) {
+    return source_index::is_expression_name("a" + std::string(1, c));
+}
+
+/* The part of the value that an item replaces: one item of a list, one word of an expression, or all of it. */
 stretch value_part(const place_in_source &place) {
     const table_attrs &attr = *place.attribute->known;
     stretch part = {place.attribute->parts.value.begin, place.offset};
@@ -313,10 +398,15 @@ stretch value_part(const place_in_source &place) {
     bool expression = std::string_view(attr.ta_name).ends_with("Expression");
     for (std::size_t at = place.offset; at > part.begin && (list || expression); --at) {
         char before = place.text()[at - 1];
-        bool ends = list ? before == ',' : !source_index::is_expression_name("a" + std::string(1, before));
+        bool ends = list ? before == ',' : !is_in_name(before);
         if (ends)
             part.begin = at;
     }
+    std::size_t last = std::max(place.offset, place.attribute->parts.value.end);
+    if (!list && !expression)
+        part.end = last;
+    while (part.end < last && (list ? place.text()[part.end] != ',' : is_in_name(place.text()[part.end])))
+        ++part.end;
     return part;
 }
 
@@ -325,6 +415,17 @@ json value_items(const session &now, const place_in_source &place) {
     items found(now, place, part);
     add_by_type(found, place, part);
     return found.take();
+}
+
+/* The end of the header or the attribute's name in which the place is; otherwise the place. */
+std::size_t end_of_word(const place_in_source &place) {
+    stretch word = is_header(place) ? place.stanza->header : stretch{place.offset, place.offset};
+    if (place.attribute != nullptr)
+        word = place.attribute->parts.name;
+    if (!word.touches(place.offset))
+        return place.offset;
+    std::string_view rest = stretch{place.offset, word.end}.of(place.text());
+    return place.offset + std::min(rest.find_first_of(" \t"), rest.size());
 }
 
 } // namespace
@@ -343,7 +444,7 @@ json completion(session &now, const json &params) {
                     place.offset >= place.attribute->parts.value.begin && begin != place.offset;
     if (in_value)
         return value_items(now, place);
-    items found(now, place, {word, place.offset});
+    items found(now, place, {word, end_of_word(place)});
     if (word == begin)
         add_stanzas(found, place);
     else if (place.stanza != nullptr && place.stanza->is_known() && before.find('=') == before.npos)

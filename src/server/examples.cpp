@@ -4,7 +4,37 @@
 
 #include "language/names.h"
 
+#include <algorithm>
+
 namespace lsp {
+
+namespace {
+
+/* "NewName"; with a number if another stanza has this name. */
+std::string new_name(std::string_view source, const source_index::index &of, const char *attribute) {
+    auto is_used = [&](std::string_view name) {
+        return std::any_of(of.stanzas.begin(), of.stanzas.end(), [&](const source_index::stanza &each) {
+            return each.is_known() && each.value(source, attribute) == name;
+        });
+    };
+    std::string first = "New" + std::string(attribute);
+    std::string name = first;
+    for (int number = 2; is_used(name); ++number)
+        name = first + std::to_string(number);
+    return name;
+}
+
+/* The upper one of two numbers must not be below the lower one. */
+std::string example_number(std::string_view source, const source_index::stanza &in, std::string_view attribute) {
+    std::string_view lower;
+    if (attribute == "ReportingInterval")
+        lower = in.value(source, "ObservationInterval");
+    else if (attribute == "LastKey")
+        lower = in.value(source, "FirstKey");
+    return lower.empty() ? "0" : std::string(lower);
+}
+
+} // namespace
 
 std::string example_value(std::string_view source, const source_index::index &of, const source_index::stanza &in,
                           const table_attrs &attr) {
@@ -26,9 +56,9 @@ std::string example_value(std::string_view source, const source_index::index &of
     case AT_STRING:
     case AT_SD_NAME:
     case AT_MANAGER:
-        return "New" + std::string(attr.ta_name);
+        return new_name(source, of, attr.ta_name);
     default:
-        return "0";
+        return example_number(source, in, attr.ta_name);
     }
 }
 

@@ -308,6 +308,35 @@ def test_values(pump, line, expected):
     assert all(each["documentation"]["value"] for each in items)
 
 
+@pytest.mark.parametrize("words, label", [
+    ("Locator=Ho|st", "Host"), ("Resource|Action", "ResourceAction"), ("\tProperties=Pub|lic,Reqd", "Public"),
+    ("\tFirst|Key=1", "FirstKey"), ("\tDataType=|String", "String"), ("Speed.Tu|rns >", "Turns"),
+])
+def test_an_item_replaces_the_whole_word(pump, words, label):
+    """At a header whose lines follow, it is only the header."""
+    at_mark = PUMP.index(words.replace("|", "")) + words.index("|")
+    items, taken = complete(pump, PUMP[:at_mark] + "|" + PUMP[at_mark:])
+    assert label in labels(items) and taken(label) == PUMP
+
+
+@pytest.mark.parametrize("before, wrong", [
+    ("ControlDefinition", "ClassToManagerMapping"), ("ControlDefinition", "ControlDefinition"),
+    ("ResourceClass", "ResourceClass"), ("DAttrSDDefinition", "ResourceAction"),
+    ("DAttrSDDefinition", "DAttrSDDefinition"), ("ActionInSDDefinition", "ActionInSDDefinition"),
+    ("ResourceAction", "OnlineSDDefinition"),
+])
+def test_stanzas_that_may_not_come_here_are_not_offered(pump, before, wrong):
+    """In front of a stanza: a second one of its kind, or one that divides a run or follows a run of another kind."""
+    at_mark = PUMP.index("\n" + before) + 1
+    items, _ = complete(pump, PUMP[:at_mark] + "|\n" + PUMP[at_mark:])
+    assert wrong not in labels(items)
+
+
+def test_no_stanza_is_offered_between_attributes(pump):
+    items, _ = complete(pump, PUMP.replace("\tLocator", "|\n\tLocator"))
+    assert items == []
+
+
 def test_types_are_those_of_the_stanza(pump):
     items, taken = complete(pump, CLASS + "PersistentResourceAttribute\n\tDataType=In|")
     assert "SDArray" in labels(items) and "SBS" not in labels(items)
@@ -528,6 +557,59 @@ def test_next_free_number(pump):
     where = "\tId=|4\n\tDataType=SD"
     made, _ = actions(pump, where, text, only=["quickfix"])
     assert made["Use the next free number, 5"] == PUMP.replace("Id=7", "Id=5")
+
+
+@pytest.mark.parametrize("words", ["\tId=|7", "\tElementIndex=|0\n\tDataType=UInt32\nResourceAction"])
+def test_numbers_that_are_right_stay(pump, words):
+    assert actions(pump, words, PUMP, only=["quickfix"])[0] == {}
+
+
+TWO = "DAttrSDDefinition\n\tElementName=Hours\n\tDescription=7\n\tDisplayName=8\n\tElementIndex=%s\n\tDataType=UInt32\n"
+
+
+def test_index_of_an_element_is_its_place(pump):
+    text = PUMP.replace("ResourceAction\n", TWO % 7 + "ResourceAction\n")
+    show(pump, text)
+    made, _ = actions(pump, "\tElementIndex=|7", text, only=["quickfix"])
+    assert made["Use the next free number, 1"] == text.replace("=7\n\tDataType=UInt32", "=1\n\tDataType=UInt32")
+    short = text.replace("\tElementIndex=0\n\tDataType=UInt32\nDAttr", "\tDataType=UInt32\nDAttr")
+    show(pump, short)
+    made, _ = actions(pump, "ElementName=Tu|rns", short, only=["quickfix"])
+    assert "\tDataType=UInt32\n\tElementIndex=0\nDAttr" in made["Add `ElementIndex`"]
+
+
+@pytest.mark.parametrize("value", ['a"b"c', "Host\r"])
+def test_values_that_quotes_would_change_get_none(pump, value):
+    text = PUMP.replace("\tName=Host\n", f"\tName={value}\n")
+    show(pump, text)
+    made, _ = actions(pump, "\tName=" + value[0] + "|" + value[1:3], text, only=["refactor"])
+    assert made == {}
+
+
+def test_lines_that_begin_in_column_1_are_not_added_again(pump):
+    text = PUMP.replace("\tName=Stop", "Name=Stop")
+    show(pump, text)
+    assert not [each for each in actions(pump, "Resource|Action", text)[0] if each.startswith("Add")]
+
+
+def test_no_lines_are_added_within_a_long_line(pump):
+    """The compiler reads its rest as a header."""
+    text = PUMP.replace("\tName=Stop\n\tDescription=9\n", "\tName=Stop" + 300 * "x" + "\n")
+    show(pump, text)
+    assert actions(pump, "Resource|Action", text, only=["quickfix"])[0] == {}
+
+
+def test_added_values_fit_the_others(pump):
+    text = PUMP.replace("\tReportingInterval=60\n", "")
+    show(pump, text)
+    made, _ = actions(pump, "Resource|Variable", text, only=["quickfix"])
+    assert made["Add `ReportingInterval`"] == PUMP.replace("ReportingInterval=60", "ReportingInterval=10")
+    text = PUMP.replace("Name=Stop", "Name=NewName") + "ResourceAction\n"
+    show(pump, text)
+    where = position(text, len(text) - 2)
+    (action,) = pump.about("textDocument/codeAction", URI, range={"start": where, "end": where},
+                           context={"diagnostics": [], "only": ["quickfix"]})
+    assert "\tName=NewName2\n" in action["edit"]["documentChanges"][0]["edits"][0]["newText"]
 
 
 def test_quotes(pump):

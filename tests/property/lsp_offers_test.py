@@ -1,0 +1,122 @@
+"""Test that nothing that `cdef lsp` offers makes a source worse: every code action of every line, and every stanza that is
+completed where a stanza may be.
+
+The sources are the class of `docs/language.md`, the examples, the cases of `golden` and of `cdef/check`, and generated ones. "Worse" means: more errors
+or, with as many errors, more warnings.
+"""
+
+import pathlib
+import random
+import re
+
+import pytest
+
+import generate_sources
+from compare import none
+from lsp_client import CAPABILITIES, Client, edited, edits_in
+from programs import PROGRAMS
+
+GROUPS = 4
+COUNT = 24  # sources that all groups look at
+SANITIZED_COUNT = 12
+LINES_MAX = 400
+UNUSED = ("S530",)  # nothing can use a variable class that has just been added
+ROOT = pathlib.Path(__file__).parents[2]
+FOLDERS = ("examples", "tests/golden", "tests/cdef/check")
+PLAIN = {key: value for key, value in CAPABILITIES.items() if key != "textDocument"}
+PLAIN["textDocument"] = {"codeAction": CAPABILITIES["textDocument"]["codeAction"]}
+
+
+def texts():
+    """name -> text: all files, in an order that looks random, and as many generated sources."""
+    paths = sorted(path for folder in FOLDERS for path in (ROOT / folder).rglob("*.cdefsrc"))
+    random.Random(1).shuffle(paths)
+    manual = (ROOT / "docs/language.md").read_bytes()
+    yield "language.md", re.search(rb"## A whole class.*?```\n(.*?)```", manual, re.S).group(1)
+    for number, path in enumerate(paths):
+        yield path.name, path.read_bytes()
+        if number % 4 == 0:
+            yield f"generated {number}", generate_sources.source(number)[0]
+
+
+def sources(group):
+    """The texts of a group. Those that are not UTF-8 or very long are left out."""
+    count = PROGRAMS.cases or (SANITIZED_COUNT if PROGRAMS.sanitizers else COUNT)
+    taken = 0
+    for number, (name, raw) in enumerate(texts()):
+        if number % GROUPS != group or b"\0" in raw or raw.count(b"\n") > LINES_MAX:
+            continue
+        try:
+            yield name, raw.decode()
+        except UnicodeDecodeError:
+            continue
+        taken += GROUPS
+        if taken >= count:
+            return
+
+
+class Judge:
+    """Compares texts by their findings."""
+
+    def __init__(self, client, unavoidable=()):
+        self.client, self.unavoidable, self.known, self.number = client, unavoidable, {}, 0
+
+    def badness(self, text):
+        """(errors, warnings)"""
+        if text not in self.known:
+            self.number += 1
+            uri = f"file:///judged/{self.number}.cdefsrc"
+            self.client.open(uri, text)
+            severities = [each["severity"] for each in self.client.diagnostics(uri)
+                          if each["code"] not in self.unavoidable]
+            self.client.notify("textDocument/didClose", textDocument={"uri": uri})
+            self.known[text] = (severities.count(1), severities.count(2))
+        return self.known[text]
+
+
+@pytest.mark.slow(20)
+@pytest.mark.parametrize("group", range(GROUPS))
+def test_actions_make_nothing_worse(group):
+    worse = []
+    with Client() as client:
+        judge = Judge(client)
+        for name, text in sources(group):
+            uri = "file:///offers.cdefsrc"
+            client.open(uri, text)
+            for line in range(len(text.split("\n"))):
+                where = {"line": line, "character": 0}
+                offered = client.about("textDocument/codeAction", uri, range={"start": where, "end": where},
+                                       context={"diagnostics": []})
+                for action in offered:
+                    if "diagnostics" not in action:
+                        after = edited(text, edits_in(action["edit"])[uri])
+                        if judge.badness(after) > judge.badness(text):
+                            worse.append((name, line, action["title"], judge.badness(text), judge.badness(after)))
+            client.notify("textDocument/didClose", textDocument={"uri": uri})
+    none(worse)
+
+
+@pytest.mark.slow(20)
+@pytest.mark.parametrize("group", range(GROUPS))
+def test_stanzas_make_nothing_worse(group):
+    """On a new line in front of each line, and on each header. In a source with errors, a new stanza may bring other
+    errors to light."""
+    worse = []
+    with Client(capabilities=PLAIN) as client:
+        judge = Judge(client, UNUSED)
+        for name, text in sources(group):
+            uri = "file:///offers.cdefsrc"
+            lines = text.split("\n")
+            places = [(at, "\n".join([*lines[:at], "", *lines[at:]])) for at in range(len(lines))]
+            places += [(at, text) for at, line in enumerate(lines) if line[:1].isalpha()]
+            if judge.badness(text)[0] > 0:
+                continue
+            client.open(uri, text)
+            for at, (line, here) in enumerate(places, 2):
+                client.change(uri, at, here)
+                for item in client.at("textDocument/completion", uri, line, 0):
+                    after = edited(here, [item["textEdit"]])
+                    if judge.badness(after) > judge.badness(here):
+                        worse.append((name, line, item["label"], judge.badness(here), judge.badness(after)))
+            client.notify("textDocument/didClose", textDocument={"uri": uri})
+    none(worse)

@@ -71,10 +71,19 @@ bool shares_numbers(const stanza &one, const stanza &other) {
            number_family(one.kind) == number_family(other.kind);
 }
 
-/* Nothing for a text that is not a decimal number, or is too large for a record. */
+/* Nothing for a text that is not a number, or is too large for a record. As for the compiler, 0x means hexadecimal, and
+ * 0 in front of other digits octal. */
 std::optional<long long> number_in(std::string_view text) {
+    constexpr int DECIMAL = 10;
+    constexpr int OCTAL = 8;
+    constexpr int HEXADECIMAL = 16;
+    int base = text.starts_with('0') && text.size() > 1 ? OCTAL : DECIMAL;
+    if (text.starts_with("0x") || text.starts_with("0X")) {
+        base = HEXADECIMAL;
+        text.remove_prefix(2);
+    }
     long long number = 0;
-    auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+    auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number, base);
     bool fits = error == std::errc() && number >= 0 && number < std::numeric_limits<vx_int32_t>::max();
     return fits && end != text.data() ? std::optional(number) : std::nullopt;
 }

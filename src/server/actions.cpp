@@ -117,6 +117,12 @@ bool may_continue(document &in, const source_index::stanza &of) {
     return !begins_line || next->header.of(in.text()).find('=') != std::string_view::npos;
 }
 
+/* Whether a line of a stanza is not understood. It may be the missing one. */
+bool has_unknown_line(const source_index::stanza &of) {
+    return std::any_of(of.attributes.begin(), of.attributes.end(),
+                       [](const source_index::attribute &each) { return each.known == nullptr; });
+}
+
 /* The line after which missing lines are inserted: the last required one in front of all optional ones. */
 std::size_t line_before_missing(const source_index::stanza &of) {
     std::size_t line = of.first_line;
@@ -130,7 +136,8 @@ std::size_t line_before_missing(const source_index::stanza &of) {
 
 void collector::add_missing_lines() {
     place_in_source place = place_at(in, part.begin);
-    if (place.stanza == nullptr || !place.stanza->is_known() || may_continue(in, *place.stanza))
+    if (place.stanza == nullptr || !place.stanza->is_known() || may_continue(in, *place.stanza) ||
+        has_unknown_line(*place.stanza))
         return;
     std::vector<const table_attrs *> missing = missing_in(*place.stanza);
     if (missing.empty())
@@ -147,13 +154,25 @@ void collector::add_missing_lines() {
     add("Add " + language::listed(names), QUICK_FIX, json::array({edit({end, end}, lines)}));
 }
 
+/* Whether the elements in front of one in its run have their right numbers. Otherwise theirs are corrected first. */
+bool follows_right_elements(document &in, const source_index::stanza &element) {
+    const std::vector<source_index::stanza> &all = in.index().stanzas;
+    return std::all_of(all.begin(), all.end(), [&](const source_index::stanza &each) {
+        bool is_before = each.run == element.run && each.run != source_index::NONE && &each < &element;
+        return !is_before || each.value(in.text(), "ElementIndex") ==
+                                 example_value(in.text(), in.index(), each, *find_attr(each.row(), "ElementIndex"));
+    });
+}
+
 void collector::add_free_number() {
     place_in_source place = place_at(in, part.begin);
     bool numbered = place.has_known_attribute() && place.attribute->parts.has_equals &&
                     (place.attribute->known->ta_type == AT_ID || place.attribute->known->ta_type == AT_SD_INDEX);
     if (!numbered)
         return;
-    if (!place.stanza->is_element() && in.index().is_free_id(in.text(), *place.stanza))
+    bool replaceable = place.stanza->is_element() ? follows_right_elements(in, *place.stanza)
+                                                  : !in.index().is_free_id(in.text(), *place.stanza);
+    if (!replaceable)
         return;
     std::string next = example_value(in.text(), in.index(), *place.stanza, *place.attribute->known);
     if (place.attribute->parts.value.of(in.text()) != next)

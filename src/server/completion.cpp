@@ -99,7 +99,8 @@ bool may_follow(const place_in_source &place, const srtable_ctrl &kind, const st
         return true;
     if (who.of_action != nullptr)
         return before->kind == SC_CLASS_ACTION || before->kind == SC_RESOURCE_ACTION ||
-               (before->is_element() && before->row().sc_sd_owner->of_action != nullptr);
+               (before->is_element() && before->row().sc_sd_owner->of_action != nullptr &&
+                before->owner != source_index::NONE);
     bool structured = before->value(place.text(), "DataType").starts_with("SD");
     bool persistent = before->kind == SC_PERSISTENT_RESOURCE_ATTRIBUTE || before->kind == SC_PERSISTENT_CLASS_ATTRIBUTE;
     return structured && before->row().sc_attr != nullptr && persistent == (who.type == SD_TYPE_PATTR);

@@ -24,6 +24,20 @@ std::string new_name(std::string_view source, const source_index::index &of, con
     return name;
 }
 
+/* A variable class that dynamic attributes use but nothing defines; empty: there is none. */
+std::string undefined_variable_class(std::string_view source, const source_index::index &of) {
+    auto is_defined = [&](std::string_view name) {
+        return std::any_of(of.stanzas.begin(), of.stanzas.end(), [&](const source_index::stanza &each) {
+            return each.kind == SC_RESOURCE_VARIABLE_CLASS && each.value(source, "VariableClass") == name;
+        });
+    };
+    for (const source_index::stanza &each : of.stanzas)
+        if (std::string_view name = each.is_known() ? each.value(source, "VariableClass") : ""; !name.empty())
+            if (!is_defined(name))
+                return std::string(name);
+    return {};
+}
+
 /* The upper one of two numbers must not be below the lower one. */
 std::string example_number(std::string_view source, const source_index::stanza &in, std::string_view attribute) {
     std::string_view lower;
@@ -55,8 +69,11 @@ std::string example_value(std::string_view source, const source_index::index &of
         return "HasResources";
     case AT_STRING:
     case AT_SD_NAME:
-    case AT_MANAGER:
-        return new_name(source, of, attr.ta_name);
+    case AT_MANAGER: {
+        bool defines_class = in.kind == SC_RESOURCE_VARIABLE_CLASS && std::string_view(attr.ta_name) == "VariableClass";
+        std::string wanted = defines_class ? undefined_variable_class(source, of) : std::string();
+        return wanted.empty() ? new_name(source, of, attr.ta_name) : wanted;
+    }
     default:
         return example_number(source, in, attr.ta_name);
     }

@@ -332,6 +332,21 @@ def test_stanzas_that_may_not_come_here_are_not_offered(pump, before, wrong):
     assert wrong not in labels(items)
 
 
+def test_elements_of_an_action_need_one(pump):
+    """A run that belongs to no action is not continued by one of the other kind."""
+    stray = PUMP[:PUMP.index("ResourceAction")] + PUMP[PUMP.index("ActionIn"):PUMP.index("ClassTo")]
+    assert "ActionOutSDDefinition" not in labels(complete(pump, stray + "|")[0])
+
+
+def test_dynamic_attributes_are_offered_where_their_ranges_are_kept(pump):
+    """Those of the class come before one of resources that has a Range."""
+    text = PUMP.replace("ResourceAction", "DynamicResourceAttribute\n\tName=Heat\n\tRange=1,2\nResourceAction")
+    after = text.index("ResourceAction\n")
+    assert "DynamicClassAttribute" not in labels(complete(pump, text[:after] + "|\n" + text[after:])[0])
+    before = text.index("PersistentResourceAttribute")
+    assert "DynamicClassAttribute" in labels(complete(pump, text[:before] + "|\n" + text[before:])[0])
+
+
 def test_no_stanza_is_offered_between_attributes(pump):
     items, _ = complete(pump, PUMP.replace("\tLocator", "|\n\tLocator"))
     assert items == []
@@ -578,6 +593,16 @@ def test_index_of_an_element_is_its_place(pump):
     assert "\tDataType=UInt32\n\tElementIndex=0\nDAttr" in made["Add `ElementIndex`"]
 
 
+def test_the_first_wrong_index_of_a_run_is_corrected_first(pump):
+    """Another one alone would be one more error."""
+    text = PUMP.replace("ResourceAction\n", TWO % 2 + TWO.replace("Hours", "Days") % 3 + "ResourceAction\n")
+    show(pump, text)
+    made, _ = actions(pump, "\tElementIndex=|2", text, only=["quickfix"])
+    assert "Use the next free number, 1" in made
+    made, _ = actions(pump, "\tElementIndex=|3", text, only=["quickfix"])
+    assert not [each for each in made if each.startswith("Use")]
+
+
 @pytest.mark.parametrize("value", ['a"b"c', "Host\r"])
 def test_values_that_quotes_would_change_get_none(pump, value):
     text = PUMP.replace("\tName=Host\n", f"\tName={value}\n")
@@ -590,6 +615,19 @@ def test_lines_that_begin_in_column_1_are_not_added_again(pump):
     text = PUMP.replace("\tName=Stop", "Name=Stop")
     show(pump, text)
     assert not [each for each in actions(pump, "Resource|Action", text)[0] if each.startswith("Add")]
+
+
+def test_lines_that_may_be_misspelt_are_not_added_again(pump):
+    text = PUMP.replace("\tName=Stop", "\tNmae=Stop")
+    show(pump, text)
+    assert not [each for each in actions(pump, "Resource|Action", text)[0] if each.startswith("Add")]
+
+
+def test_added_variable_class_is_the_one_in_use(pump):
+    text = PUMP.replace("\tVariableClass=Flow\n\tObs", "\tObs")
+    show(pump, text)
+    made, _ = actions(pump, "Resource|Variable", text, only=["quickfix"])
+    assert made["Add `VariableClass`"] == text.replace("Interval=60\n", "Interval=60\n\tVariableClass=Flow\n")
 
 
 def test_no_lines_are_added_within_a_long_line(pump):

@@ -132,6 +132,18 @@ TEST(Numbers, ContinueAfterTheHighest) {
     EXPECT_EQ(whole.next_id(source, whole.stanzas[0]), std::nullopt);
 }
 
+TEST(Numbers, AreReadAsTheCompilerReadsThem) {
+    std::string source =
+        "ControlDefinition\nResourceAction\n\tId=0x1F\nResourceAction\n\tId=010\nResourceAction\n\tId=8\n"
+        "ResourceAction\n\tId=x\n";
+    source_index::index whole = source_index::index_of(source);
+    EXPECT_EQ(whole.next_id(source, whole.stanzas[4]), 32);
+    EXPECT_FALSE(whole.is_free_id(source, whole.stanzas[2]));
+    EXPECT_FALSE(whole.is_free_id(source, whole.stanzas[3]));
+    EXPECT_FALSE(whole.is_free_id(source, whole.stanzas[4]));
+    EXPECT_TRUE(whole.is_free_id(source, whole.stanzas[1]));
+}
+
 TEST(Numbers, OfElementsCountInTheirRun) {
     std::string source = "ControlDefinition\nResourceAction\nActionInSDDefinition\n\tElementIndex=0\n"
                          "ActionInSDDefinition\nActionOutSDDefinition\n";

@@ -37,12 +37,17 @@ std::optional<std::size_t> number_of(std::string_view digits) {
     return number;
 }
 
+/* The value may be in quotation marks. */
 bool names_utf8(std::string_view type) {
-    std::size_t at = type.find("charset=");
-    if (at == std::string_view::npos)
+    constexpr std::string_view NAME = "charset=";
+    auto found = std::search(type.begin(), type.end(), NAME.begin(), NAME.end(),
+                             [](char x, char y) { return std::tolower(static_cast<unsigned char>(x)) == y; });
+    if (found == type.end())
         return true;
-    std::string_view charset = trimmed(type.substr(at + std::string_view("charset=").size()));
+    std::string_view charset = type.substr(static_cast<std::size_t>(found - type.begin()) + NAME.size());
     charset = trimmed(charset.substr(0, charset.find(';')));
+    if (charset.size() > 1 && charset.starts_with('"') && charset.ends_with('"'))
+        charset = charset.substr(1, charset.size() - 2);
     return is_same_name(charset, "utf-8") || is_same_name(charset, "utf8");
 }
 
@@ -95,7 +100,7 @@ void frame_reader::begin_body() {
     in_body = true;
     awaited = fields ? *fields->length : 0;
     current = {};
-    if (!fields)
+    if (!fields || awaited > SKIPPED_MAX)
         current.state = frame_state::bad_header;
     else if (awaited > BODY_MAX)
         current.state = frame_state::too_large;
@@ -113,17 +118,24 @@ bool frame_reader::take_body(std::string_view &bytes) {
 }
 
 std::optional<frame> frame_reader::take(std::string_view &bytes) {
-    if (lost)
-        bytes = {};
-    if (lost || (!in_body && !take_header(bytes)))
-        return std::nullopt;
-    if (!in_body)
-        begin_body();
-    if (!take_body(bytes))
-        return std::nullopt;
-    in_body = false;
-    lost = current.state == frame_state::bad_header;
-    return std::exchange(current, {});
+    for (;;) {
+        if (lost)
+            bytes = {};
+        if (lost || (!in_body && !take_header(bytes)))
+            return std::nullopt;
+        if (!in_body) {
+            begin_body();
+            lost = current.state == frame_state::bad_header;
+            if (current.state != frame_state::whole)
+                return frame{current.state}; /* reported before its body has come, which is skipped */
+        }
+        if (!take_body(bytes))
+            return std::nullopt;
+        in_body = false;
+        frame taken = std::exchange(current, {});
+        if (taken.state == frame_state::whole)
+            return taken;
+    }
 }
 
 std::string framed(std::string_view body) {

@@ -96,6 +96,11 @@ const json *method_of(const json &message) {
     return method != nullptr && method->is_string() ? method : nullptr;
 }
 
+bool is_of_protocol(const json &message) {
+    const json *version = optional_member(message, "jsonrpc");
+    return version != nullptr && *version == "2.0";
+}
+
 /* The identifier of a request; null for anything else. */
 const json *request_id(const json &message) {
     const json *id = optional_member(message, "id");
@@ -131,7 +136,7 @@ void server::receive(const frame &message) {
         if (!content.is_object())
             return refuse(nullptr, INVALID_REQUEST, "the message is not an object");
         const json *method = method_of(content);
-        if (method != nullptr && *method == "$/cancelRequest" && !content.contains("id"))
+        if (is_of_protocol(content) && method != nullptr && *method == "$/cancelRequest" && !content.contains("id"))
             return cancel(params_of(content));
         waiting.push_back({std::move(content), message.body.size()});
         waiting_bytes += message.body.size();
@@ -178,10 +183,13 @@ void server::finish_step() {
 void server::handle(const waiting_message &waited) {
     const json &message = waited.content;
     const json *id = optional_member(message, "id");
-    if (method_of(message) == nullptr) {
-        bool is_response = message.contains("result") || message.contains("error");
+    bool is_response = method_of(message) == nullptr && (message.contains("result") || message.contains("error"));
+    json answered = id != nullptr && is_id(*id) && !is_response ? *id : json();
+    if (!is_of_protocol(message))
+        refuse(answered, INVALID_REQUEST, "the message is not JSON-RPC 2.0");
+    else if (method_of(message) == nullptr) {
         if (!is_response)
-            refuse(id != nullptr && is_id(*id) ? *id : json(), INVALID_REQUEST, "the message has no method");
+            refuse(answered, INVALID_REQUEST, "the message has no method");
         else if (id != nullptr && id->is_string())
             now.sources.take_answer(now, id->get<std::string>(), message.contains("result"));
     } else if (message.contains("id") && (id == nullptr || !is_id(*id)))

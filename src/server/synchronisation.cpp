@@ -5,9 +5,33 @@
 #include "server/publishing.h"
 #include "server/uris.h"
 
+#include <optional>
+#include <utility>
+#include <vector>
+
 namespace lsp {
 
 namespace {
+
+/* A change as the client sent it; without a range it replaces everything. */
+struct content_change {
+    std::optional<range> part;
+    std::string text;
+};
+
+/* Throws request_error if one of them is malformed. */
+std::vector<content_change> changes_in(const json &params) {
+    const json &all = member(params, "contentChanges");
+    if (!all.is_array())
+        throw request_error(INVALID_PARAMS, "contentChanges is not a list");
+    std::vector<content_change> changes;
+    for (const json &each : all) {
+        const json *part = optional_member(each, "range");
+        changes.push_back(
+            {part == nullptr ? std::nullopt : std::optional(range_from(*part)), text_member(each, "text")});
+    }
+    return changes;
+}
 
 /* Checks the file of a document again if it belongs to a folder. */
 void look_at_file(session &now, const std::string &key) {
@@ -25,19 +49,17 @@ void did_open(session &now, const json &params) {
     now.unpublished.insert(key);
 }
 
+/* Reads the whole message first: of a malformed one, nothing is applied. */
 void did_change(session &now, const json &params) {
     document &changed = now.document_in(params);
-    const json &all = member(params, "contentChanges");
-    if (!all.is_array())
-        throw request_error(INVALID_PARAMS, "contentChanges is not a list");
-    for (const json &each : all) {
-        const json *part = optional_member(each, "range");
-        if (part == nullptr)
-            changed.replace(text_member(each, "text"));
+    int version = number_member(member(params, "textDocument"), "version");
+    for (content_change &each : changes_in(params)) {
+        if (each.part)
+            changed.replace(*each.part, each.text, now.client.units);
         else
-            changed.replace(range_from(*part), text_member(each, "text"), now.client.units);
+            changed.replace(std::move(each.text));
     }
-    changed.set_version(number_member(member(params, "textDocument"), "version"));
+    changed.set_version(version);
     now.unpublished.insert(key_of(changed.uri()));
 }
 

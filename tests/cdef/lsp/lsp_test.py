@@ -127,11 +127,18 @@ def test_frame_that_is_too_large_is_refused_alone():
 
 @pytest.mark.parametrize("body, code", [
     (b"", -32700), (b"{", -32700), (b'"\xff"', -32700), (b"[]", -32600), (b"1", -32600), (b"{}", -32600),
-    (b"[" * 200 + b"]" * 200, -32600), (b"{" * 200000, -32600), (b'{"method": 1}', -32600),
-    (b'{"id": null, "method": "a"}', -32600), (b'{"id": [], "method": "a"}', -32600),
+    (b"[" * 200 + b"]" * 200, -32600), (b"{" * 200000, -32600), (b'{"jsonrpc": "2.0", "method": 1}', -32600),
+    (b'{"jsonrpc": "2.0", "id": null, "method": "a"}', -32600), (b'{"jsonrpc": "2.0", "id": [], "method": "a"}', -32600),
+    (b'{"method": "$/cancelRequest"}', -32600), (b'{"jsonrpc": "1.0", "method": "exit"}', -32600),
+    (b'{"jsonrpc": 2.0, "id": 7, "result": null}', -32600),
 ], ids=itertools.count())
 def test_what_is_no_message_is_refused_alone(body, code):
     assert codes(talk(frame(body) + frame(INITIALIZE))[0]) == [(None, code), (1, None)]
+
+
+@pytest.mark.parametrize("version", [{}, {"jsonrpc": "1.0"}, {"jsonrpc": None}])
+def test_request_of_another_version_is_refused(version):
+    assert codes(talk(frame({**version, "id": 7, "method": "shutdown"}) + frame(INITIALIZE))[0]) == [(7, -32600), (1, None)]
 
 
 def test_responses_are_not_answered():
@@ -212,6 +219,20 @@ def test_escapes_in_a_uri_do_not_matter():
         client.open("file:///a%20b/%41.cdefsrc", PUMP)
         client.change("file:///a%20b/A.cdefsrc", 2, "nonsense\n")
         assert client.diagnostics("file:///a%20b/%41.cdefsrc", 2)
+
+
+@pytest.mark.parametrize("wrong", [
+    {"range": {"start": {"line": 0, "character": 0}, "end": {"line": -1, "character": 0}}, "text": ""}, {"text": 1}, {}, 1,
+], ids=itertools.count())
+def test_of_a_malformed_message_no_change_is_applied(wrong):
+    with Client() as client:
+        client.open(URI, PUMP)
+        assert client.diagnostics(URI) == []
+        client.change(URI, 2, "nonsense\n", wrong)
+        client.change(URI, 3, {"range": {"start": {"line": 0, "character": 0}, "end": {"line": 0, "character": 0}},
+                               "text": "# x\n"})
+        assert [each["code"] for each in client.diagnostics(URI, 3)] == []
+        assert [each["method"] for each in client.notes] == ["window/logMessage"]
 
 
 def test_change_of_an_unknown_document_is_logged():

@@ -38,6 +38,26 @@ TEST(Frames, PassOverABodyThatIsTooLarge) {
     EXPECT_EQ(bodies_of(stream, 65536), (texts{"!", "b"}));
 }
 
+/* A client that waits for an answer learns at once that there will be none. */
+TEST(Frames, AreRefusedBeforeTheirBodyHasCome) {
+    EXPECT_EQ(bodies_of("Content-Length: 99999999\r\n\r\n", 5), texts{"!"});
+    EXPECT_EQ(bodies_of("Content-Length: 9\r\nContent-Type: a; charset=utf-16\r\n\r\n", 5), texts{"!"});
+}
+
+TEST(Frames, EndAtALengthThatNobodyWillWaitFor) {
+    lsp::frame_reader reader;
+    std::string_view bytes = "Content-Length: 9999999999\r\n\r\n";
+    EXPECT_EQ(reader.take(bytes)->state, lsp::frame_state::bad_header);
+}
+
+TEST(Frames, MayNameTheirCharsetInQuotes) {
+    for (const char *charset : {"\"UTF-8\"", "utf8", "\"utf-8\" ; x=y"})
+        EXPECT_EQ(bodies_of(std::string("Content-Type: a; Charset=") + charset + "\r\n" + lsp::framed("b"), 5),
+                  texts{"b"})
+            << charset;
+    EXPECT_EQ(bodies_of("Content-Type: a; charset=\"\r\n" + lsp::framed("b"), 5), texts{"!"});
+}
+
 TEST(Frames, SayWhetherOneHasBegun) {
     lsp::frame_reader reader;
     EXPECT_TRUE(reader.is_between());

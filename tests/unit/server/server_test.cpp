@@ -12,8 +12,10 @@ using lsp::json;
 
 /* All that a server says to these messages. */
 std::vector<json> said(lsp::server &to, const std::vector<json> &messages) {
-    for (const json &each : messages)
+    for (json each : messages) {
+        each["jsonrpc"] = "2.0";
         to.receive({lsp::frame_state::whole, each.dump()});
+    }
     std::vector<json> all;
     while (to.has_work())
         to.work();

@@ -8,7 +8,9 @@
 #include "server/session.h"
 
 #include <algorithm>
+#include <filesystem>
 #include <string_view>
+#include <system_error>
 #include <tuple>
 #include <utility>
 
@@ -33,6 +35,12 @@ std::vector<std::tuple<std::string_view, int, std::size_t>> places_elsewhere(con
 bool is_same(const check::finding &a, const check::finding &b) {
     return std::string_view(a.code) == b.code && a.text == b.text && a.at.file_line == b.at.file_line &&
            a.at.column == b.at.column && places_elsewhere(a) == places_elsewhere(b);
+}
+
+std::string without_links(const std::string &path) {
+    std::error_code failed;
+    std::string target = std::filesystem::weakly_canonical(path, failed).string();
+    return failed ? path : target;
 }
 
 } // namespace
@@ -89,6 +97,7 @@ void workspace::check(session &now, const std::string &path) {
         return publish(now, report::uri_of(path));
     }
     workspace_file &file = known[path];
+    file.target = without_links(path);
     if (open != now.open.end()) {
         const compiled_source *made = known.size() > 1 ? open->second.compiled() : nullptr;
         file.facts = made == nullptr ? std::nullopt : std::optional(made->facts);
@@ -102,14 +111,17 @@ void workspace::check(session &now, const std::string &path) {
     uncompared = true;
 }
 
-/* In the order of the paths, as a build of a directory compares them. */
+/* In the order of the paths, as a build of a directory compares them. A file that has several names because of links
+ * is one source: that without a link or, if it is outside the folders, the first one. */
 void workspace::compare(session &now) {
     uncompared = false;
     build::class_family family;
+    std::set<std::string> compared;
     for (auto &[path, file] : known) {
         const std::string uri = report::uri_of(path);
         std::vector<check::finding> found;
-        if (file.facts)
+        bool is_again = (file.target != path && known.contains(file.target)) || !compared.insert(file.target).second;
+        if (file.facts && !is_again)
             found = family.add(path, *file.facts, now.settings.wanted_in(uri));
         if (std::equal(found.begin(), found.end(), file.across.begin(), file.across.end(), is_same))
             continue;

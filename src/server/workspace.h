@@ -22,6 +22,7 @@ struct workspace_file {
     std::vector<check::finding> own;         /* of the file; not used while the document is open */
     std::vector<check::finding> across;      /* conflicts with other classes */
     std::optional<build::class_facts> facts; /* none: it has errors, or has not been checked yet */
+    std::string target;                      /* the path without symbolic links; empty: not checked yet */
 };
 
 class workspace {

@@ -91,6 +91,25 @@ def test_related_columns_of_other_classes_count_code_units(folder):
             uri_of(a), "\u03b1\U0001d50a", "the manager `\u03b1\U0001d50a`")
 
 
+def test_links_are_not_other_classes(folder):
+    """Not even those that the editor opens, nor two to one file outside of the folder."""
+    (folder / "0.cdefsrc").symlink_to(folder / "a.cdefsrc")
+    (folder / "deep/b.cdefsrc").unlink()
+    outside = folder / ".hidden/c.cdefsrc"
+    outside.write_text(PUMP.replace("Name=Pump", "Name=Fan").replace("ResourceManager=M", "ResourceManager=N")
+                       .replace("Flow", "Stream").replace("m.cat", "n.cat"))
+    for name in ("x.cdefsrc", "y.cdefsrc"):
+        (folder / name).symlink_to(outside)
+    (folder / "z.cdefsrc").write_text(PUMP.replace("m.cat", "o.cat").replace("Flow", "Surge"))
+    with Client(root=folder) as client:
+        client.open(uri_of(folder / "0.cdefsrc"), PUMP)
+        wait_for(client, folder / "z.cdefsrc", ["S611"])
+        settle(client)
+        assert [related[0] for related in related(client, folder / "z.cdefsrc")] == [uri_of(folder / "a.cdefsrc")]
+        for name in ("0", "a", "x", "y"):
+            assert codes(client, folder / f"{name}.cdefsrc") == []
+
+
 def test_open_document_counts_in_the_place_of_its_file(folder):
     path = folder / "deep/b.cdefsrc"
     with Client(root=folder) as client:

@@ -19,7 +19,7 @@ bool is_digit(char c) {
     return c >= '0' && c <= '9';
 }
 
-/* The end of the quoted text that begins here, after its closing quote. */
+/* The end of the quoted text that begins here, after its closing quote; npos if it has none. */
 std::size_t end_of_quoted(std::string_view text, std::size_t open) {
     for (std::size_t at = open + 1; at < text.size(); ++at) {
         if (text[at] == '\\')
@@ -27,7 +27,7 @@ std::size_t end_of_quoted(std::string_view text, std::size_t open) {
         else if (text[at] == text[open])
             return at + 1;
     }
-    return text.size();
+    return std::string_view::npos;
 }
 
 std::size_t end_of_word(std::string_view text, std::size_t begin) {
@@ -56,6 +56,21 @@ std::vector<expression_name> names_in(std::string_view expression) {
         }
     }
     return found;
+}
+
+bool is_in_quotes(std::string_view expression, std::size_t offset) {
+    for (std::size_t at = 0; at < std::min(offset, expression.size());) {
+        char c = expression[at];
+        if (c != '"' && c != '\'') {
+            at += c == '\\' ? 2 : 1;
+            continue;
+        }
+        std::size_t end = end_of_quoted(expression, at);
+        if (offset < end)
+            return true;
+        at = end;
+    }
+    return false;
 }
 
 bool is_expression_name(std::string_view text) {

@@ -18,6 +18,9 @@ struct expression_name {
 /* The words of an expression that are outside of quotes and do not begin with a digit. */
 std::vector<expression_name> names_in(std::string_view expression);
 
+/* Whether a cursor at this offset is inside of quotes in an expression. */
+bool is_in_quotes(std::string_view expression, std::size_t offset);
+
 /* Whether a text is one such word. */
 bool is_expression_name(std::string_view text);
 

@@ -6,6 +6,8 @@
 #include "language/suggestions.h"
 #include "server/examples.h"
 #include "server/places.h"
+#include "text/shown.h"
+#include "text/unified_diff.h"
 
 #include <algorithm>
 
@@ -17,18 +19,25 @@ constexpr std::string_view QUICK_FIX = "quickfix";
 constexpr std::string_view REWRITE = "refactor.rewrite";
 constexpr std::string_view FIX_ALL = "source.fixAll.cdef";
 
-/* Whether the client wants actions of this kind. A client that names no kinds wants all. */
-bool is_wanted(const json &params, std::string_view kind) {
+/* The kinds that the client wants; null: it names none and wants all. */
+const json *wanted_kinds(const json &params) {
     const json *context = optional_member(params, "context");
     const json *only = context == nullptr ? nullptr : optional_member(*context, "only");
-    if (only == nullptr || !only->is_array())
-        return true;
-    return std::any_of(only->begin(), only->end(), [&](const json &each) {
-        if (!each.is_string())
-            return false;
-        std::string wanted = each.get<std::string>();
-        return wanted.empty() || kind == wanted || kind.starts_with(wanted + ".");
-    });
+    return only != nullptr && only->is_array() ? only : nullptr;
+}
+
+/* Whether the client asks for this kind, or for a kind that includes it, by name. */
+bool is_named(const json &params, std::string_view kind) {
+    const json *only = wanted_kinds(params);
+    return only != nullptr && std::any_of(only->begin(), only->end(), [&](const json &each) {
+               std::string wanted = each.is_string() ? each.get<std::string>() : std::string();
+               return !wanted.empty() && (kind == wanted || kind.starts_with(wanted + "."));
+           });
+}
+
+bool is_wanted(const json &params, std::string_view kind) {
+    const json *only = wanted_kinds(params);
+    return only == nullptr || is_named(params, kind) || std::find(only->begin(), only->end(), "") != only->end();
 }
 
 /* Collects the actions for a request. */
@@ -46,7 +55,7 @@ public:
         }
         if (is_wanted(params, REWRITE))
             add_quotes();
-        if (is_wanted(params, FIX_ALL))
+        if (is_named(params, FIX_ALL)) /* it checks the source several times, too often for each move of a cursor */
             add_all_corrections();
         return std::move(all);
     }
@@ -78,7 +87,7 @@ std::string title_of(const check::finding &found) {
         return "Correct " + std::to_string(edits.size()) + " places";
     const check::edit &one = edits.front();
     auto shown = [](std::string_view text) {
-        return text.find('\n') == text.npos ? language::quoted(text) : std::string("a line");
+        return text.find('\n') == text.npos ? language::quoted(text::escaped(text)) : std::string("a line");
     };
     if (one.text.find_first_not_of("\r\n") == std::string::npos)
         return one.removed.find_first_not_of("\r\n\t ") == std::string::npos ? "Remove blanks"
@@ -196,34 +205,15 @@ void collector::add_quotes() {
         add("Put the value in quotes", REWRITE, json::array({edit(place.attribute->parts.value, quotes)}));
 }
 
-/* The parts of two texts between their common beginning and their common end. */
-struct difference {
-    stretch old_part;
-    stretch new_part;
-};
-
-difference difference_of(std::string_view before, std::string_view after) {
-    auto first = static_cast<std::size_t>(
-        std::mismatch(before.begin(), before.end(), after.begin(), after.end()).first - before.begin());
-    std::size_t begin = before.substr(0, first).rfind('\n') + 1;
-    std::size_t shorter = std::min(before.size(), after.size()) - begin;
-    std::size_t end = 0;
-    while (end < shorter && before[before.size() - 1 - end] == after[after.size() - 1 - end])
-        ++end;
-    while (end > 0 && before[before.size() - end] != '\n')
-        --end;
-    end -= end > 0 ? 1 : 0; /* do not split the end of a line */
-    return {{begin, before.size() - end}, {begin, after.size() - end}};
-}
-
+/* One edit for each run of changed lines. */
 void collector::add_all_corrections() {
     const std::string &before = in.text();
     check::fixed_source fixed = check::fix_bytes(before, "source", now.settings.wanted_in(in.uri()));
-    if (fixed.text == before)
-        return;
-    difference made = difference_of(before, fixed.text);
-    add("Correct all that is certain", FIX_ALL,
-        json::array({edit(made.old_part, std::string(made.new_part.of(fixed.text)))}));
+    json edits = json::array();
+    for (const text::line_change &each : text::changed_lines(before, fixed.text))
+        edits.push_back(edit({each.begin, each.end}, std::string(each.by)));
+    if (!edits.empty())
+        add("Correct all that is certain", FIX_ALL, std::move(edits));
 }
 
 } // namespace

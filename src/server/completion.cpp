@@ -312,6 +312,9 @@ void add_properties(items &to, const place_in_source &place, const stretch &item
 /* Attributes of the class or, after a dot, the elements of the attribute before it. */
 void add_expression_names(items &to, const place_in_source &place, const stretch &word) {
     const source_index::names &names = place.in.names();
+    const stretch &value = place.attribute->parts.value;
+    if (source_index::is_in_quotes(value.of(place.text()), place.offset - value.begin))
+        return;
     auto scope = static_cast<std::size_t>(place.stanza->class_number);
     bool member = word.begin > 0 && place.text()[word.begin - 1] == '.';
     if (!member) {

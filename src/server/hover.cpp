@@ -102,8 +102,10 @@ shown attribute_shown(const session &now, const place_in_source &place) {
     std::string text =
         attribute_documentation(place.stanza->row(), *attribute.known) + bytes_of(place) + message_text(now, place);
     stretch value = attribute.parts.value;
-    if (!attribute.parts.has_equals || !value.touches(place.offset))
+    if (attribute.parts.name.touches(place.offset))
         return {text, attribute.parts.name};
+    if (!value.touches(place.offset))
+        return {text, attribute.parts.written}; /* on a quotation mark, or on a blank in front of it */
     stretch item = item_at(place.text(), value, place.offset);
     std::string about = value_documentation(*attribute.known, item.of(place.text()));
     if (about.empty()) {

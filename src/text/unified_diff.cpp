@@ -108,6 +108,21 @@ void add_hunk(std::string &to, const comparison &both, const change *first, cons
 
 } // namespace
 
+std::vector<line_change> changed_lines(std::string_view before, std::string_view after) {
+    comparison both = {lines_of(before), lines_of(after)};
+    auto begin_of = [](const line_list &lines, std::string_view text, std::size_t line) {
+        return line == lines.size() ? text.size() : static_cast<std::size_t>(lines[line].data() - text.data());
+    };
+    std::vector<line_change> all;
+    for (const change &each : both.changes()) {
+        std::size_t begin = begin_of(both.after, after, each.after.begin);
+        std::size_t end = begin_of(both.after, after, each.after.end);
+        all.push_back({begin_of(both.before, before, each.before.begin), begin_of(both.before, before, each.before.end),
+                       after.substr(begin, end - begin)});
+    }
+    return all;
+}
+
 std::string unified_diff(std::string_view old_name, std::string_view new_name, std::string_view before,
                          std::string_view after) {
     comparison both = {lines_of(before), lines_of(after)};

@@ -185,6 +185,14 @@ def test_hover_shows_a_stanza(pump):
     assert "- required: `Name`, `Description`, `DisplayName`, `Id` and `VarietyRange`" in text
 
 
+@pytest.mark.parametrize("words, shown", [
+    ('Expression=|"Speed.Turns > 9', '"Speed.Turns > 9 && Speed.Turns < 99"'),
+    ('Turns < 99"|', '"Speed.Turns > 9 && Speed.Turns < 99"'), ("Expr|ession=\"Speed.", "Expression"),
+])
+def test_range_of_a_hover_contains_the_place(pump, words, shown):
+    assert hover(pump, words)[1] == shown
+
+
 def test_hover_is_silent_in_comments_and_unknown_lines(pump):
     assert hover(pump, "# A p|ump") is None
     show(pump, "Nonsense\n\tName=a\n")
@@ -298,6 +306,9 @@ def test_name_before_an_equals_sign_keeps_it(pump):
     ("\tId=|", ["8"]),
     ("\tExpression=\"Speed.|", ["Turns"]),
     ("\tExpression=\"Sp|", ["Speed", "Host"]),
+    ("\tExpression=\"Speed == '|", []),
+    ("\tExpression=\"Speed == '|'\"", []),
+    ("\tExpression=\"Speed == 'a' && |\"", ["Speed", "Host"]),
     ("\tName=|", []),
     ("\t# |", []),
 ])
@@ -549,10 +560,26 @@ def test_correction_of_carriage_returns_is_one_that_the_protocol_can_say(pump):
 
 
 def test_all_that_is_certain(pump):
-    text = PUMP.replace("FirstKey", "FirstKy").replace("LastKey", "LastKy")
+    """Each run of wrong lines is one edit. The editor has to ask for it."""
+    text = PUMP.replace("FirstKey", "FirstKy").replace("LastKey", "LastKy").replace("\tLocator", "\tLocater")
     show(pump, text)
-    made, _ = actions(pump, "# A| pump", text, only=["source.fixAll"])
+    made, (action,) = actions(pump, "# A| pump", text, only=["source.fixAll"])
     assert made == {"Correct all that is certain": PUMP}
+    same([each["newText"] for each in action["edit"]["documentChanges"][0]["edits"]],
+         ["\tLocator=Host\n", "\tFirstKey=1\n\tLastKey=2\n"], "edits")
+    for context in ({}, {"only": []}, {"only": [""]}, {"only": ["quickfix"]}):
+        assert "Correct all that is certain" not in actions(pump, "# A| pump", text, **context)[0]
+
+
+@pytest.mark.parametrize("line, title", [
+    ("\ufeff# A pump.", "Remove `\\xef\\xbb\\xbf`"),
+    ("\tFirst\u200bKey=1", "Replace `First\\xe2\\x80\\x8bKey` with `FirstKey`"),
+])
+def test_titles_show_what_is_invisible(pump, line, title):
+    plain = line.replace("\ufeff", "").replace("\u200b", "")
+    text = PUMP.replace(plain, line)
+    show(pump, text)
+    assert actions(pump, line[:1] + "|" + line[1:], text, only=["quickfix"])[0][title] == PUMP
 
 
 def test_missing_lines_are_added_where_they_may_be(pump):

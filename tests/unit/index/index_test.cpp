@@ -122,6 +122,14 @@ TEST(Names, OfTwoClassesAreTwo) {
               (places{"0:3*", "1:6*"}));
 }
 
+TEST(Quotes, ContainTheOffsetsBetweenThem) {
+    std::string_view text = R"(A == 'b\'c' && "d" 'e)";
+    std::string inside;
+    for (std::size_t at = 0; at <= text.size(); ++at)
+        inside += source_index::is_in_quotes(text, at) ? '^' : ' ';
+    EXPECT_EQ(inside, "      ^^^^^     ^^  ^^");
+}
+
 TEST(Numbers, ContinueAfterTheHighest) {
     std::string source = "ControlDefinition\nPersistentResourceAttribute\n\tId=4\nDynamicResourceAttribute\n\tId=7\n"
                          "PersistentClassAttribute\n\tId=9\nResourceAction\nPersistentResourceAttribute\n\tId=5\n";

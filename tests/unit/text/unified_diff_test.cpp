@@ -52,4 +52,14 @@ TEST(UnifiedDiff, TakesManyChangedLines) {
     EXPECT_TRUE(made.ends_with("+298\n+299\n"));
 }
 
+TEST(ChangedLines, AreWholeLinesOfBothTexts) {
+    std::vector<std::string> shown;
+    for (const text::line_change &each : text::changed_lines("a\nb\nc\nd\ne", "a\nB\nc\nd\nx\ny"))
+        shown.push_back(std::to_string(each.begin) + "-" + std::to_string(each.end) + " " + std::string(each.by));
+    EXPECT_EQ(shown, (std::vector<std::string>{"2-4 B\n", "8-9 x\ny"}));
+    EXPECT_TRUE(text::changed_lines("a\n", "a\n").empty());
+    EXPECT_EQ(text::changed_lines("", "a\n").front().by, "a\n");
+    EXPECT_EQ(text::changed_lines("a\nb\n", "a\n").front().begin, 2U);
+}
+
 } // namespace

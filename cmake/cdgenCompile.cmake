@@ -5,33 +5,60 @@
 # TARGET is made if it does not exist and then belongs to "all"; an existing one, of several databases or a program that
 # needs them, waits for the database.
 #
-#   BYTE_ORDER    of the machines that will read the database; that of the machine that builds if left out. With both,
-#                 OUTPUT NAME.cdef stands for NAME.le.cdef and NAME.be.cdef
-#   NO_TIMESTAMP  the database has no time of building: equal sources then make equal files
+#   BYTE_ORDER    of the machines that will read the database. If left out, cdef.toml chooses it, and without that it is
+#                 that of the machine that builds. With both, OUTPUT NAME.cdef stands for NAME.le.cdef and NAME.be.cdef
+#   NO_TIMESTAMP  the database has no time. If left out, it has the time in the environment variable SOURCE_DATE_EPOCH or,
+#                 if that is not set when the database is built, the time at which it is built
 #   WERROR        a source with warnings makes no database
 #   GATE          a source that breaks those who rely on an older version makes no database either. BASELINE is that
-#                 version as "cdef gate" takes it: a file, a directory, or git:REVISION[:PATH]; relative paths count from
-#                 the current source directory. cdef.toml chooses the level, and the file of numbers, which is ids.lock
-#                 beside cdef.toml, or beside the source, if left out
+#                 version as "cdef gate" takes it: a file, a directory, git:REVISION or git:REVISION:PATH; relative paths
+#                 count from the current source directory. cdef.toml chooses the level, and the file of numbers, which is
+#                 ids.lock beside cdef.toml, or beside the source, if left out
 #
-# The database is built again when the source, its cdef.toml or cdef has changed; GATE is checked in each build. If the
-# source has errors, the old database stays.
+# The database is built again when the source, its cdef.toml or cdef has changed, also if a cdef.toml has been added or
+# removed; GATE is checked in each build. If the source has errors, the old database stays.
 
-# The project file that cdef finds for a source; empty if there is none.
+# The project file that cdef finds for a source; empty if there is none. CMake runs again if there is another one when
+# the project is built.
 function(cdgen_project_file SOURCE variable)
+  cmake_path(GET SOURCE PARENT_PATH given)
+  file(REAL_PATH "${given}" at)
   set(found "")
-  cmake_path(GET SOURCE PARENT_PATH at)
-  while(NOT found)
-    if(EXISTS "${at}/cdef.toml" AND NOT IS_DIRECTORY "${at}/cdef.toml")
-      set(found "${at}/cdef.toml")
+  set(patterns "")
+  while(TRUE)
+    cmake_path(APPEND at "cdef.toml" OUTPUT_VARIABLE candidate)
+    if(NOT found AND (EXISTS "${candidate}" OR IS_SYMLINK "${candidate}"))
+      set(found "${candidate}")
     endif()
+    string(REGEX REPLACE "([[*?])" "[\\1]" pattern "${candidate}")
+    list(APPEND patterns "${pattern}")
     cmake_path(GET at PARENT_PATH above)
     if(above STREQUAL at)
       break()
     endif()
     set(at "${above}")
   endwhile()
+  file(GLOB unused CONFIGURE_DEPENDS ${patterns})
+  if(found)
+    set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS "${found}")
+  endif()
   set("${variable}" "${found}" PARENT_SCOPE)
+endfunction()
+
+# The names of the databases that "cdef build" makes with these options, in the directory of OUTPUT. A cdef.toml with
+# errors is reported when the database is built.
+function(cdgen_databases OUTPUT options variable)
+  get_target_property(cdef cdgen::cdef LOCATION)
+  cmake_path(GET OUTPUT PARENT_PATH place)
+  execute_process(COMMAND "${cdef}" build --list ${options} -- x.cdefsrc
+    RESULT_VARIABLE status OUTPUT_VARIABLE listed ERROR_VARIABLE said OUTPUT_STRIP_TRAILING_WHITESPACE)
+  set(databases "${OUTPUT}")
+  if(status EQUAL 0)
+    string(REPLACE "\n" ";${place}/" databases "${place}/${listed}")
+  elseif(said MATCHES "must end in .cdef")
+    message(FATAL_ERROR "cdgen_compile: ${said}")
+  endif()
+  set("${variable}" "${databases}" PARENT_SCOPE)
 endfunction()
 
 function(cdgen_compile TARGET SOURCE OUTPUT)
@@ -39,9 +66,7 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
   if(DEFINED arg_UNPARSED_ARGUMENTS OR DEFINED arg_KEYWORDS_MISSING_VALUES)
     message(FATAL_ERROR "cdgen_compile: cannot read \"${arg_UNPARSED_ARGUMENTS}${arg_KEYWORDS_MISSING_VALUES}\"")
   endif()
-  if(NOT DEFINED arg_BYTE_ORDER)
-    set(arg_BYTE_ORDER native)
-  elseif(NOT arg_BYTE_ORDER MATCHES "^(native|little|big|both)$")
+  if(DEFINED arg_BYTE_ORDER AND NOT arg_BYTE_ORDER MATCHES "^(native|little|big|both)$")
     message(FATAL_ERROR "cdgen_compile: BYTE_ORDER is native, little, big or both, not \"${arg_BYTE_ORDER}\"")
   endif()
   if(NOT TARGET cdgen::cdef)
@@ -53,16 +78,16 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
   cmake_path(GET OUTPUT PARENT_PATH place)
   cmake_path(GET OUTPUT FILENAME name)
 
-  set(databases "${OUTPUT}")
-  if(arg_BYTE_ORDER STREQUAL "both")
-    string(REGEX REPLACE "\\.cdef$" "" base "${OUTPUT}")
-    set(databases "${base}.le.cdef" "${base}.be.cdef")
+  cdgen_project_file("${SOURCE}" project)
+  set(config --no-config)
+  if(project)
+    set(config "--config=${project}")
   endif()
-  set(time now)
-  if(arg_NO_TIMESTAMP)
-    set(time none)
+  set(options "--output=${name}" "${config}")
+  if(DEFINED arg_BYTE_ORDER)
+    list(APPEND options "--byte-order=${arg_BYTE_ORDER}")
   endif()
-  set(options "--output=${name}" "--byte-order=${arg_BYTE_ORDER}" "--timestamp=${time}")
+  cdgen_databases("${OUTPUT}" "${options}" databases)
   if(arg_WERROR)
     list(APPEND options --werror)
   endif()
@@ -71,8 +96,9 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
   string(MD5 hash "${shown}")
   string(SUBSTRING "${hash}" 0 8 hash)
 
-  cdgen_project_file("${SOURCE}" project)
-  set(depends ${project})
+  # Changed options build the database again, such as another cdef.toml, even if that is old.
+  set(known "${CMAKE_CURRENT_BINARY_DIR}/CMakeFiles/cdgen_${hash}.options")
+  file(CONFIGURE OUTPUT "${known}" CONTENT "${options}\n" @ONLY)
   set(gate "")
   if(DEFINED arg_GATE)
     if(NOT arg_GATE MATCHES "^git:")
@@ -86,7 +112,7 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
     # versions or a file of numbers has changed.
     set(gate "cdgen_gate_${hash}")
     add_custom_target("${gate}"
-      COMMAND "$<TARGET_FILE:cdgen::cdef>" gate "--against=${arg_GATE}" ${strict} -- "${SOURCE}"
+      COMMAND "$<TARGET_FILE:cdgen::cdef>" gate "--against=${arg_GATE}" "${config}" ${strict} -- "${SOURCE}"
       VERBATIM)
   endif()
 
@@ -100,11 +126,15 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
   endif()
 
   # A class without a Name is named after the output as given on the command line, which is the bare file name.
+  set(time "time=none")
+  if(NOT arg_NO_TIMESTAMP)
+    set(time "time=$\{SOURCE_DATE_EPOCH-now}")
+  endif()
+  set(build "mkdir -p \"$0\" && cd \"$0\" && ${time} && exec \"$@\" \"--timestamp=$time\"")
   add_custom_command(OUTPUT ${databases}
-    COMMAND "${CMAKE_COMMAND}" -E make_directory "${place}"
-    COMMAND "${CMAKE_COMMAND}" -E chdir "${place}" "$<TARGET_FILE:cdgen::cdef>" build ${options} -- "${SOURCE}"
+    COMMAND sh -c "${build}" "${place}" "$<TARGET_FILE:cdgen::cdef>" build "${SOURCE}" ${options}
     ${restat}
-    DEPENDS "${SOURCE}" ${depends} ${gate} "$<TARGET_FILE:cdgen::cdef>"
+    DEPENDS "${SOURCE}" ${project} "${known}" ${gate} "$<TARGET_FILE:cdgen::cdef>"
     COMMENT "Building class definition ${shown}"
     VERBATIM)
 

@@ -171,6 +171,79 @@ class Compile:
             self.build()
         self.assertIn("S509", str(failed.exception))
 
+    def order_of(self, name):
+        return self.made(name)[8:12]
+
+    def test_project_file_that_is_made_after_configuring(self):
+        """In a directory above the source, with a time that is older than the database. It is noticed too if it is
+        removed."""
+        sub = self.here / "sub [1]"
+        sub.mkdir()
+        (sub / "a.cdefsrc").write_bytes(disk().read_bytes())
+        self.project('cdgen_compile(disk "sub [1]/a.cdefsrc" a.cdef)')
+        self.build()
+        native = self.order_of("a.cdef")
+        other = BIG if native == LITTLE else LITTLE
+        file = self.here / "cdef.toml"
+        file.write_text(f"[build]\nbyte-order = '{'big' if other == BIG else 'little'}'\n")
+        os.utime(file, (5, 5))
+        self.build()
+        self.assertEqual(self.order_of("a.cdef"), other)
+        (sub / "cdef.toml").write_text("[build]\nbyte-order = 'native'\n")
+        self.build()
+        self.assertEqual(self.order_of("a.cdef"), native)
+        (sub / "cdef.toml").unlink()
+        self.build()
+        self.assertEqual(self.order_of("a.cdef"), other)
+        file.unlink()
+        self.build()
+        self.assertEqual(self.order_of("a.cdef"), native)
+        self.assertNotIn("Building class definition", self.build())
+
+    def test_project_file_chooses_both_byte_orders(self):
+        """A word overrides it. A change of the file takes effect in the next build."""
+        (self.here / "cdef.toml").write_text("[build]\nbyte-order = 'both'\n")
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)\ncdgen_compile(one a.cdefsrc one.cdef BYTE_ORDER big)",
+                     a=disk().read_bytes())
+        self.build()
+        self.assertEqual((self.order_of("a.le.cdef"), self.order_of("a.be.cdef")), (LITTLE, BIG))
+        self.assertEqual(self.order_of("one.cdef"), BIG)
+        self.assertNotIn("Building class definition", self.build())
+        (self.here / "cdef.toml").write_text("[build]\nbyte-order = 'little'\n")
+        later(self.here / "cdef.toml")
+        self.build()
+        self.assertEqual(self.order_of("a.cdef"), LITTLE)
+
+    def test_mistake_in_a_project_file_is_reported_when_building(self):
+        (self.here / "cdef.toml").write_text("[build]\nbyte-oder = 'both'\n")
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=disk().read_bytes())
+        with self.assertRaises(AssertionError) as failed:
+            self.build()
+        self.assertIn(f"{self.here}/cdef.toml:2:1: unknown key of [build]: `byte-oder`", str(failed.exception))
+        (self.here / "cdef.toml").write_text("[build]\nbyte-order = 'both'\n")
+        later(self.here / "cdef.toml")
+        self.build()
+        self.assertEqual(self.order_of("a.be.cdef"), BIG)
+
+    def test_project_file_of_a_linked_directory(self):
+        """It is that of the real directory, as for cdef."""
+        real = self.here / "elsewhere/real"
+        real.mkdir(parents=True)
+        (real / "a.cdefsrc").write_bytes(disk().read_bytes())
+        (self.here / "elsewhere/cdef.toml").write_text("[build]\nbyte-order = 'big'\n")
+        (self.here / "linked").symlink_to("elsewhere/real")
+        (self.here / "cdef.toml").write_text("[build]\nbyte-order = 'little'\n")
+        self.project("cdgen_compile(disk linked/a.cdefsrc a.cdef)")
+        self.build()
+        self.assertEqual(self.order_of("a.cdef"), BIG)
+
+    def test_changed_words_build_again(self):
+        for order, magic in (("little", LITTLE), ("big", BIG)):
+            self.project(f"cdgen_compile(disk a.cdefsrc a.cdef BYTE_ORDER {order})", a=disk().read_bytes())
+            os.utime(self.here / "a.cdefsrc", (5, 5))
+            self.build()
+            self.assertEqual(self.order_of("a.cdef"), magic)
+
     def test_what_a_killed_build_left_behind_is_cleared(self):
         self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=disk().read_bytes())
         (self.here / "b/.a.cdef.cdef-new").write_bytes(b"half")
@@ -234,6 +307,16 @@ class Compile:
         self.assertNotEqual(self.made("with.cdef")[16:20], bytes(4))
         self.assertEqual(self.made("without.cdef")[16:24], bytes(8))
 
+    def test_time_of_the_environment(self):
+        """When the project is built. NO_TIMESTAMP overrides it."""
+        self.project("cdgen_compile(with a.cdefsrc with.cdef BYTE_ORDER little)\n"
+                     "cdgen_compile(without a.cdefsrc without.cdef BYTE_ORDER little NO_TIMESTAMP)",
+                     a=disk().read_bytes())
+        environment = {name: value for name, value in os.environ.items() if name != "VX_CDB_FORCE_EMPTY_TIMESTAMP"}
+        run("cmake", "--build", self.here / "b", env={**environment, "SOURCE_DATE_EPOCH": "77"})
+        self.assertEqual(self.made("with.cdef")[16:24], bytes([77, 0, 0, 0, 0, 0, 0, 0]))
+        self.assertEqual(self.made("without.cdef")[16:24], bytes(8))
+
     def test_several_targets_from_a_subdirectory_in_parallel(self):
         sub = self.here / "classes"
         sub.mkdir()
@@ -260,6 +343,9 @@ class Compile:
             with self.subTest(words), self.assertRaises(AssertionError) as failed:
                 self.project(f"cdgen_compile(disk a.cdefsrc a.cdef {words})", a=disk().read_bytes())
             self.assertIn("cdgen_compile:", str(failed.exception))
+        with self.assertRaises(AssertionError) as failed:
+            self.project("cdgen_compile(disk a.cdefsrc a.db BYTE_ORDER both)", a=disk().read_bytes())
+        self.assertIn("the database's name must end in .cdef", " ".join(str(failed.exception).split()))
 
 
 class Ninja(Compile, Trial):

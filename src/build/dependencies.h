@@ -3,7 +3,9 @@
 #define CDGEN_BUILD_DEPENDENCIES_H
 
 #include "build/plan.h"
+#include "check/check.h"
 
+#include <optional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -16,6 +18,15 @@ std::string rule_name(std::string_view path);
 
 /* A rule for each unit. */
 std::string dependencies_of(std::span<const unit> units);
+
+/* Where a name is in a rule. */
+enum class rule_side { target, prerequisite };
+
+/* The program that reads a name in a rule differently, "Make" or "Ninja"; empty: both read it as it is. */
+std::string_view misreader_of(std::string_view path, rule_side side);
+
+/* The warning about the first name in a unit's rule that Make or Ninja reads differently. */
+std::optional<check::finding> misread_name_in(const unit &what);
 
 } // namespace build
 

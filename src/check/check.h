@@ -63,6 +63,7 @@ enum warning_id {
     SHARED_KEYS,
     OTHER_MANAGER,
     OTHER_VARIABLE_CLASS,
+    RULE_NAME,
     WARNING_COUNT
 };
 

@@ -133,7 +133,8 @@ int build_all(const build_options &options) {
     signal(SIGPIPE, SIG_IGN);
     for (const std::string &directory : directories)
         make_directory(directory);
-    build_run run(units, {wanted_time(options), options.findings, std::move(rules), options.sync});
+    build_run run(
+        units, {wanted_time(options), options.findings, std::move(rules), options.sync, options.depfile.has_value()});
     build_command::do_in_order<outcome>(
         units.size(), options.jobs, [&run](std::size_t index) { return run.make(index); },
         [&run](std::size_t index, outcome &&made) { run.show(index, std::move(made)); });

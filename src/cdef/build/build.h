@@ -20,6 +20,7 @@ struct run_options {
     const finding_options &findings;
     std::vector<finding_rules> rules; /* for each unit */
     bool sync;
+    bool with_depfile; /* true: names that its readers take for others are reported */
 };
 
 /* The result for one source. */

@@ -1,6 +1,7 @@
 /* run.cpp: one run of the subcommand that builds databases from sources. */
 
 #include "build/compile.h"
+#include "build/dependencies.h"
 #include "cdef/build/build.h"
 #include "cdef/build/store.h"
 #include "cdef/support/failure.h"
@@ -74,6 +75,11 @@ void build_run::show(size_t index, outcome &&made) {
         made.findings.push_back(std::move(found));
         ++made.count.warnings;
     }
+    if (options.with_depfile && options.rules[index].wanted[check::RULE_NAME])
+        if (std::optional<check::finding> misread = build::misread_name_in(units[index])) {
+            made.findings.push_back(std::move(*misread));
+            ++made.count.warnings;
+        }
     line.clear();
     writer->begin_source(units[index].source);
     for (const check::finding &found : made.findings)

@@ -24,7 +24,7 @@ maker make_carriage_return, make_class_bit, make_comma_list, make_comment_in_val
 
 namespace {
 
-/* Warnings about several classes, which no check of one source can report. */
+/* Warnings about several classes or about names of files, which no check of one source can report. */
 made_watcher make_nothing(const watcher_setup &setup) {
     return make<watcher>(setup);
 }
@@ -242,6 +242,12 @@ constexpr row rows[] = {
       "Two classes that are built together have a `ResourceVariableClass` of the same name, with different intervals "
       "or aliases.",
       "Make them alike, or give one of them another name."},
+     make_nothing},
+    {{RULE_NAME, "S615", "rule-name", "a build system misreads the name of a file",
+      "The file of `--depfile` has a name that Make and Ninja do not both read as it is. Ninja then builds the "
+      "database "
+      "every time, and Make does not notice a change of the source. Only `cdef build` reports this.",
+      "Rename the file or its directory. If only the other program reads the file, turn the warning off."},
      make_nothing},
 };
 

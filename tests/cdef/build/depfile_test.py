@@ -4,6 +4,7 @@ The rule of the build system in these tests does not name the source. So only if
 a change of the source's time rebuild the database, and then exactly once.
 """
 
+import json
 import os
 import shutil
 import subprocess
@@ -13,10 +14,10 @@ import pytest
 from cases import HEAD, check
 
 ODD_NAMES = ["plain", "two words", "cash$", "hash#", "a:b", "back\\slash", "comma,", "~tilde", "(b)", "[a]", "\u00e4",
-             "@at", "{b}", "!"]
+             "@at", "{b}", "!", "end\\", "back\\ slash"]
 # One of the two cannot read these, or reads them in another way.
 FOR_NINJA_ONLY = ["per%cent", "a=b"]
-FOR_MAKE_ONLY = ["end\\", "back\\ slash", "slash\\#", "a*", "a?", "<>", "^", "quote'", 'double"', "&"]
+FOR_MAKE_ONLY = ["slash\\#", "a*", "a?", "<>", "^", "quote'", 'double"', "&"]
 
 
 def tool(name):
@@ -54,7 +55,7 @@ def counted(world):
 def project(world, name):
     """A script that builds the class and counts its runs, and the source."""
     script = world.path("build.sh")
-    script.write_text(f'#!/bin/sh\necho run >>log\nexec {world.cdef} build --depfile=deps -o "$(cat target)" "$(cat source)"\n')
+    script.write_text(f'#!/bin/sh\necho run >>log\nexec {world.cdef} build -q --depfile=deps -o "$(cat target)" "$(cat source)"\n')
     script.chmod(0o755)
     source = world.path(f"{name}.cdefsrc")
     source.write_bytes(HEAD)
@@ -108,6 +109,56 @@ def test_make_rebuilds_exactly_once_after_a_change(world, name):
     source.unlink()
     failed = subprocess.run([tool("make"), "-r"], capture_output=True, text=True, timeout=60, **world.options())
     check(failed.returncode == 2 and f"No rule to make target '{source.name}'" in failed.stderr, failed.stderr)
+
+
+def misread(world, *names):
+    """The program that is said to misread each of these sources, or None."""
+    result = world.inspect("build", "--depfile=deps", "-d", "made", "--format=json", *names)
+    said = {}
+    for source in json.loads(result.stdout)["sources"]:
+        found = [each["message"] for each in source["findings"] if each["code"] == "S615"]
+        said[source["file"]] = found[0].partition(" ")[0] if found else None
+    return [said[name] for name in names]
+
+
+def test_warns_of_names_that_one_of_the_two_reads_differently(world):
+    """And only of those."""
+    for names, expected in ((ODD_NAMES, None), (FOR_NINJA_ONLY, "Make"), (FOR_MAKE_ONLY, "Ninja")):
+        sources = [f"{name}.cdefsrc" for name in names]
+        for name in sources:
+            world.write(name, HEAD)
+        check(misread(world, *sources) == [expected] * len(names), names, misread(world, *sources))
+
+
+def read_by_ninja(world, rules):
+    """The names that Ninja reads in each of these rules."""
+    text = "rule touch\n  command = touch $out\n"
+    for number, rule in enumerate(rules):
+        world.write(f"rule{number}", rule + b"\n")
+        text += f"build out{number}: touch\n  depfile = rule{number}\n  deps = gcc\n"
+    world.write("build.ninja", text.encode())
+    subprocess.run([tool("ninja"), "--quiet", "-k", "0"], capture_output=True, timeout=60, check=False, **world.options())
+    known = subprocess.run([tool("ninja"), "-t", "deps"], capture_output=True, timeout=60, check=True, **world.options())
+    names = {}
+    for line in known.stdout.split(b"\n"):
+        if line.startswith(b"out"):
+            names[line.partition(b":")[0]] = read = []
+        elif line:
+            read.append(line.removeprefix(b"    "))
+    return [names.get(b"out%d" % number, []) for number in range(len(rules))]
+
+
+def test_ninja_reads_the_names_of_which_nobody_is_warned(world):
+    """And no others. Each character is tried within a name, at its end, and after a backslash."""
+    characters = "".join(map(chr, (*range(1, 48), *range(57, 66), *range(90, 98), *range(122, 128), 228)))
+    names = [before + each + after for each in characters if each not in "\n;|/" for before, after in ("12", ("3", ""), "\\4")]
+    for name in names:
+        world.write(name, HEAD)
+    said = misread(world, *names)
+    rules = [line.partition(b".cdef: ")[2] for line in world.path("deps").read_bytes().split(b"\n")[:-1]]
+    check(len(rules) == len(names), rules)
+    for name, program, read in zip(names, said, read_by_ninja(world, [b"out: " + rule for rule in rules])):
+        check((program == "Ninja") == (read != [name.encode()]), name, program, read)
 
 
 def test_has_a_rule_for_each_source(world):

@@ -12,6 +12,7 @@
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
+#include <filesystem>
 #include <memory>
 #include <tuple>
 
@@ -146,6 +147,14 @@ reading load(const std::string &path) {
     if (!file || std::ferror(file.get()) != 0)
         return {{.path = path}, {{0, 0, std::strerror(errno)}}};
     return parse({bytes.data(), size}, path);
+}
+
+reading load_found(const std::string &path) {
+    std::error_code error;
+    std::filesystem::file_status is = std::filesystem::status(path, error);
+    if (std::filesystem::exists(is) && !std::filesystem::is_regular_file(is))
+        return {{.path = path}, {{0, 0, "not a regular file"}}};
+    return load(path);
 }
 
 std::string as_text(const std::string &path, const problem &what) {

@@ -68,10 +68,13 @@ reading parse(std::string_view bytes, const std::string &path);
 /* The same with a file. */
 reading load(const std::string &path);
 
-/* The project file for a source: the next regular file of that name in the source's directory or above it, seen from
- * the working directory. Symbolic links to directories are followed first. The source need not exist. "-" is looked for
- * from the working directory. Empty if there is none. */
+/* The project file for a source: the next one of that name in the source's directory or above it, seen from the working
+ * directory. It is no directory, but may be of any other kind. Symbolic links to directories are followed first. The
+ * source need not exist. "-" is looked for from the working directory. Empty if there is none. */
 std::string find(const std::string &source);
+
+/* Reads a file that find() has found. One that is not a regular file is an error. */
+reading load_found(const std::string &path);
 
 /* "PATH:LINE:COLUMN: text" */
 std::string as_text(const std::string &path, const problem &what);

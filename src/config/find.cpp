@@ -18,13 +18,22 @@ fs::path directory_of(const std::string &source) {
     return error ? fs::path() : resolved;
 }
 
+/* The path itself if there is no working directory any more. */
+std::string seen_from_here(const fs::path &path) {
+    std::error_code error;
+    fs::path here = fs::current_path(error);
+    fs::path near = error ? path : fs::proximate(path, here, error);
+    return (error ? path : near).string();
+}
+
 } // namespace
 
 std::string find(const std::string &source) {
     std::error_code error;
     for (fs::path at = directory_of(source); !at.empty(); at = at.parent_path()) {
-        if (fs::path candidate = at / FILE_NAME; fs::is_regular_file(candidate, error))
-            return fs::proximate(candidate, error).string();
+        fs::path candidate = at / FILE_NAME;
+        if (fs::exists(fs::symlink_status(candidate, error)) && !fs::is_directory(candidate, error))
+            return seen_from_here(candidate);
         if (at == at.parent_path())
             break;
     }

@@ -13,7 +13,7 @@ const check::warning_set &projects::of_file(const std::string &path) {
     auto [at, is_new] = by_file.try_emplace(path);
     if (!is_new)
         return at->second;
-    config::reading read = path.empty() ? config::reading() : config::load(path);
+    config::reading read = path.empty() ? config::reading() : only ? config::load(path) : config::load_found(path);
     if (!path.empty())
         problems[std::filesystem::weakly_canonical(path).string()] = read.problems;
     at->second = (read.problems.empty() ? read.values : config::settings()).warnings();

@@ -29,7 +29,7 @@ const std::string &project_files::path_for(const std::string &source) {
 }
 
 const config::settings &project_files::load(const std::string &path) {
-    config::reading read = config::load(path);
+    config::reading read = options.file ? config::load(path) : config::load_found(path);
     for (size_t i = 0; i + 1 < read.problems.size(); ++i)
         print_error(config::as_text(path, read.problems[i]));
     if (!read.problems.empty())

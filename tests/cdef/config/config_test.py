@@ -1,6 +1,9 @@
 """Test how `cdef check` and `cdef build` use project files, cdef.toml. What such a file may say, and what is reported of
 one with errors, tests/unit/config shows."""
 
+import os
+import subprocess
+
 import pytest
 
 from cases import HEAD, SOURCE, check, expect
@@ -123,3 +126,27 @@ def test_is_refused_with_errors(world, command):
            b"cdef: cdef.toml:2:8: unknown warning `ocatl`; did you mean `octal`?\n"
            b"cdef: cdef.toml:3:2: unknown table `biuld`; did you mean `build`?\n")
     check(not world.path("x.cdef").exists(), "made")
+
+
+@pytest.mark.parametrize("command", COMMANDS)
+def test_refuses_what_is_not_a_regular_file(world, command):
+    """It is not ignored, and no program waits for what another may write to it."""
+    world.path("a").mkdir()
+    world.write("a/x.cdefsrc", HEAD)
+    file = world.path("a/cdef.toml")
+    for make, remove, why in ((lambda: os.mkfifo(file), file.unlink, b"not a regular file"),
+                              (lambda: file.symlink_to("nowhere"), file.unlink, b"No such file or directory")):
+        make()
+        expect(world.inspect(*command, "a/x.cdefsrc"), 2, b"cdef: a/cdef.toml: " + why + b"\n")
+        remove()
+
+
+def test_is_found_without_a_working_directory(world):
+    """If the working directory has been removed, the file has its absolute name."""
+    world.write(SOURCE, ODD)
+    project(world, b"[warnings]\noff = ['octal']\n")
+    world.path("gone").mkdir()
+    script = 'cd gone && rmdir ../gone && exec "$@"'
+    result = subprocess.run(["sh", "-c", script, "sh", world.cdef, "check", world.path(SOURCE)], capture_output=True,
+                            check=False, **world.options())
+    expect(result, 0)

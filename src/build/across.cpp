@@ -47,15 +47,17 @@ std::string keys_of(const mapping &map) {
 
 } // namespace
 
-/* The place of a class is known only for the last class of a source, which is usually the only one. The places of
- * variable classes are no longer known. */
+/* If a class has two ResourceClass stanzas, only the place of the last class is known. */
 class_facts facts_of(const check::view &source, std::span<const std::byte> image) {
     cdb::database db(image);
     class_facts facts;
     for (const auto &each : db.classes())
         facts.classes.push_back({{}, std::string(each.name()), {}});
+    const std::vector<int> &lines = source.known.class_lines;
     if (!facts.classes.empty())
         facts.classes.back() = on_line(source, source.known.class_stanza().header.line, facts.classes.back().text);
+    for (size_t i = 0; i + 1 < facts.classes.size() && lines.size() == facts.classes.size(); ++i)
+        facts.classes[i] = on_line(source, lines[i], facts.classes[i].text);
     auto managers = db.managers().begin();
     for (const auto &each : db.maps()) {
         mention manager = map_line(source, "ResourceManager");
@@ -68,6 +70,11 @@ class_facts facts_of(const check::view &source, std::span<const std::byte> image
                                           std::string(each.alias()),
                                           each.record().rvc_obsv_interval,
                                           each.record().rvc_report_interval});
+    const std::vector<mention> &names = source.known.variable_class_names;
+    for (size_t i = 0; i < names.size() && names.size() == facts.variable_classes.size(); ++i) {
+        variable_class &named = facts.variable_classes[i];
+        named.name = found_in_file(source, {names[i].at, named.name.text, names[i].source});
+    }
     return facts;
 }
 

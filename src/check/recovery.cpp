@@ -173,6 +173,9 @@ void recovery::note_given() {
         return;
     auto at = static_cast<size_t>(latest.attr - table_of(known.kind).sc_attrs.data());
     int &given = known.stanza().given[at];
+    if (given == 0 && known.kind == SC_RESOURCE_VARIABLE_CLASS &&
+        std::string_view(latest.attr->ta_name) == "VariableClass")
+        known.variable_class_names.push_back(see.value_mention());
     if (given == 0) {
         given = line.number;
         known.stanza().suspect = false;

@@ -57,6 +57,15 @@ TEST_F(Across, ReportsAClassOfTheSameName) {
     EXPECT_EQ(add("c", changed("Name=Pump", "Name=pump", changed("MessageCatalog=m", "MessageCatalog=o"))), codes());
 }
 
+TEST_F(Across, KnowsThePlaceOfEachClassInASource) {
+    std::string first = found_in::CLASS.substr(0, found_in::CLASS.find("ClassToManagerMapping")); /* 9 lines */
+    EXPECT_EQ(add("a", first + changed("Name=Pump", "Name=Fan")), codes());
+    EXPECT_EQ(add("b", changed("MessageCatalog=m", "MessageCatalog=n")),
+              codes{"S611 3 the class `Pump` is also in a:3"});
+    EXPECT_EQ(add("c", changed("Name=Pump", "Name=Fan", changed("MessageCatalog=m", "MessageCatalog=o"))),
+              codes{"S611 3 the class `Fan` is also in a:12"});
+}
+
 TEST_F(Across, ReportsKeysThatOverlapInOneCatalog) {
     std::string other = changed("Name=Pump", "Name=Fan");
     EXPECT_EQ(add("a", found_in::CLASS), codes());
@@ -83,8 +92,8 @@ TEST_F(Across, ReportsVariableClassesThatDiffer) {
     EXPECT_EQ(add("a", found_in::CLASS + variables("V", "5")), codes());
     EXPECT_EQ(add("b", other + variables("V", "5") + variables("W", "6")), codes());
     EXPECT_EQ(add("c", third + variables("V", "6") + variables("W", "6", "\tAlias=U\n")),
-              codes{"S614 0 the variable class `V` has other intervals or another alias than in a"});
-    EXPECT_EQ(others, codes{"a:0:0 the other variable class `V`"});
+              codes{"S614 17:16+1 the variable class `V` has other intervals or another alias than in a:17"});
+    EXPECT_EQ(others, codes{"a:17:16 the other variable class `V`"});
 }
 
 TEST_F(Across, IsSilentAboutWhatIsNotWanted) {

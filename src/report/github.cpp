@@ -48,6 +48,9 @@ public:
         text += github_command{.file = file}.with(why);
         write();
     }
+    void fail_output(const std::string &why) override {
+        text += github_command{.file = file}.with(why);
+    }
     void close() override {}
 
 private:

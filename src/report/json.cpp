@@ -81,6 +81,8 @@ public:
     void end_source(const check::totals &count) override {
         to.close();
         add_counts(count);
+        if (!unwritten.empty())
+            add_unwritten();
         to.close();
         all.errors += count.errors;
         all.warnings += count.warnings;
@@ -89,6 +91,9 @@ public:
         to.close();
         to.add_text("unreadable", why);
         to.close();
+    }
+    void fail_output(const std::string &why) override {
+        unwritten.push_back(why);
     }
     void close() override {
         to.close();
@@ -117,6 +122,14 @@ private:
         to.close();
     }
 
+    void add_unwritten() {
+        to.open_list("unwritten");
+        for (const std::string &why : unwritten)
+            to.add_text({}, why);
+        to.close();
+        unwritten.clear();
+    }
+
     void add_counts(const check::totals &count) {
         to.add_number("errors", count.errors);
         to.add_number("warnings", count.warnings);
@@ -124,6 +137,7 @@ private:
 
     json_writer to;
     check::totals all;
+    std::vector<std::string> unwritten; /* why files made from the source could not be written */
 };
 
 } // namespace

@@ -27,6 +27,9 @@ public:
     virtual void end_source(const check::totals &count) = 0;
     /* Ends a source that could not be read to its end. why: a message that names the source. */
     virtual void fail_source(const std::string &why) = 0;
+    /* Something that is made from the source could not be written; before end_source(). The text form leaves this to
+     * the caller. */
+    virtual void fail_output(const std::string &why) = 0;
     /* There are no more sources. */
     virtual void close() = 0;
 };

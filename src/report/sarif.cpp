@@ -128,6 +128,9 @@ public:
     void fail_source(const std::string &why) override {
         to.fail(file, why);
     }
+    void fail_output(const std::string &why) override {
+        to.fail(file, why);
+    }
     void close() override {
         to.close();
     }

@@ -95,6 +95,7 @@ public:
         write_certain();
         write();
     }
+    void fail_output(const std::string & /* why */) override {}
     void close() override {
         for (; !waiting.empty(); waiting.pop_front())
             append(waiting.front());

@@ -84,6 +84,8 @@ void build_run::show(size_t index, outcome &&made) {
     writer->begin_source(units[index].source);
     for (const check::finding &found : made.findings)
         writer->add(found);
+    for (const std::string &unwritten : made.unwritten)
+        writer->fail_output(unwritten);
     if (made.unreadable.empty())
         writer->end_source(made.count);
     else

@@ -150,6 +150,23 @@ TEST(GithubForm, EscapesWhatSeparates) {
               "::error file=a%2Cb%3Ac%25?.cdefsrc::f: cannot read\n");
 }
 
+TEST(AllForms, HaveFilesThatCouldNotBeWritten) {
+    written github(report::github_form), gitlab(report::gitlab_form), json(report::json_form);
+    for (written *to : {&github, &gitlab, &json}) {
+        to->form->fail_output("f.cdef: cannot write");
+        to->form->end_source({0, 0});
+        to->form->begin_source("g");
+        to->form->end_source({0, 0});
+        to->form->close();
+    }
+    EXPECT_NE(github.text.find("::error file=f::f.cdef: cannot write\n"), std::string::npos) << github.text;
+    EXPECT_NE(gitlab.text.find("\"description\": \"f.cdef: cannot write\""), std::string::npos) << gitlab.text;
+    EXPECT_NE(json.text.find("\"warnings\": 0,\n      \"unwritten\": [\n        \"f.cdef: cannot write\"\n      ]\n"),
+              std::string::npos)
+        << json.text;
+    EXPECT_EQ(json.text.find("unwritten"), json.text.rfind("unwritten"));
+}
+
 TEST(GithubForm, CountsLinesAsTheFileDoes) {
     written to(report::github_form);
     check::finding found = finding_at(true, 5);

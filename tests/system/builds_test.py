@@ -123,6 +123,21 @@ def test_fault_at_each_system_call(world, options):
         recovers(world, new, name, number)
 
 
+def synced(world, *arguments):
+    """The files for which a build with --sync waits, in order."""
+    check(ended(traced(world, ["-y", "-e", "trace=fsync"], "build", "--sync", *arguments)) == (0, b""), "not made")
+    here = str(world.directory.resolve())
+    return [os.path.relpath(name, here) for name in re.findall(r"fsync\(\d+<(.*?)>\)", world.path("trace").read_text())]
+
+
+def test_sync_waits_for_all_that_a_database_needs(world):
+    """Its contents, its name, and the directories that are made for it. A database that has not changed may have been
+    written by a build that has not waited."""
+    check(synced(world, "-d", "a/b/", SOURCE) == ["a/b", "a/b", "a/b", "a", "a", ".", "a/b/.class.cdef.cdef-new", "a/b"],
+          "of new directories")
+    check(synced(world, "-d", "a/b/", SOURCE) == ["a/b/class.cdef", "a/b"], "of an unchanged database")
+
+
 @pytest.mark.slow(6)
 def test_killed_at_each_system_call(world):
     """The build cannot clean up."""

@@ -99,8 +99,11 @@ assignment assignment_of(const build_options &options) {
 void list_outputs(const std::vector<build::unit> &units) {
     std::string names;
     for (const build::unit &each : units)
-        for (const build::output &made : each.outputs)
+        for (const build::output &made : each.outputs) {
+            if (made.path.find('\n') != std::string::npos)
+                throw failure("--list: " + made.path + ": the name has a newline");
             names.append(made.path).append("\n");
+        }
     print(names);
 }
 
@@ -113,11 +116,18 @@ void require_no_contradiction(const build_options &options) {
         throw failure("-o - and --depfile: standard output has no name for which dependencies could be written");
 }
 
-void make_directory(const std::string &path) {
+/* sync: waits until all directories that are made are on the disk. */
+void make_directory(const std::string &path, bool sync) {
+    namespace fs = std::filesystem;
+    std::vector<std::string> new_ones;
     std::error_code error;
-    std::filesystem::create_directories(path, error);
+    for (fs::path at = path; sync && !at.empty() && !fs::exists(at, error); at = at.parent_path())
+        new_ones.push_back(at.string());
+    fs::create_directories(path, error);
     if (error)
         throw failure(path + ": " + error.message());
+    for (const std::string &made : new_ones)
+        sync_file(made);
 }
 
 int build_all(const build_options &options) {
@@ -132,7 +142,7 @@ int build_all(const build_options &options) {
                                * signal */
     signal(SIGPIPE, SIG_IGN);
     for (const std::string &directory : directories)
-        make_directory(directory);
+        make_directory(directory, options.sync);
     build_run run(
         units, {wanted_time(options), options.findings, std::move(rules), options.sync, options.depfile.has_value()});
     build_command::do_in_order<outcome>(

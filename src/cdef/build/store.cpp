@@ -47,8 +47,11 @@ stored store(std::span<const std::byte> image, const std::string &path, const st
     bool exists = stat(path.c_str(), &target) == 0;
     if (exists && is_same_file(target, source))
         throw failure(path + ": cannot write: it is the source");
-    if (exists && is_up_to_date(path, target, image))
+    if (exists && is_up_to_date(path, target, image)) {
+        if (sync)
+            sync_file(path);
         return stored::UNCHANGED;
+    }
     replace_file(path, text_of(image), {.sync = sync});
     return stored::WRITTEN;
 }

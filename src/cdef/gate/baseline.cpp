@@ -31,6 +31,8 @@ older_version version_in(const std::string &file) {
     std::vector<std::byte> bytes = cdb::read_file(file.c_str(), error);
     if (error)
         throw failure(file + ": " + error.message());
+    if (bytes.empty())
+        throw failure(file + ": the file is empty");
     return {file, std::move(bytes)};
 }
 

@@ -33,6 +33,7 @@ constexpr mode_t PRIVATE_MODE = 0600; /* until the contents are whole */
 /* Thrown when a step fails; the caller, which knows the path, completes the message. */
 struct step_failed {
     int error;
+    std::string name = {}; /* of the file, if it is not the target */
 };
 
 void require(bool done) {
@@ -94,13 +95,14 @@ bool lock(int fd, bool wait) {
 void clear_away(const std::string &name, bool wait) {
     descriptor old(open(name.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC));
     if (!old.is_open()) {
-        require(errno == ENOENT);
+        if (errno != ENOENT)
+            throw step_failed{errno, name};
         return;
     }
     struct stat file = {};
     require(fstat(old.get(), &file) == 0);
     if (!S_ISREG(file.st_mode))
-        throw step_failed{EEXIST};
+        throw step_failed{EEXIST, name};
     if (lock(old.get(), wait) && has_name(old.get(), name))
         require(unlink(name.c_str()) == 0 || errno == ENOENT);
 }
@@ -274,12 +276,23 @@ void remove_remains(const std::string &target) {
     }
 }
 
+void sync_file(const std::string &path) {
+    try {
+        descriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC));
+        require(file.is_open() && fsync(file.get()) == 0);
+        sync_directory(target_of(path));
+    } catch (const step_failed &step) {
+        throw failure(path + ": cannot write: " + std::strerror(step.error));
+    }
+}
+
 void replace_file(const std::string &path, std::string_view contents, const replacement_options &options) {
     std::string target = target_of(path);
     try {
         replace_target(target, contents, options);
     } catch (const step_failed &step) {
-        throw failure(path + ": cannot write: " + std::strerror(step.error));
+        throw failure(path + ": cannot write: " + (step.name.empty() ? "" : step.name + ": ") +
+                      std::strerror(step.error));
     } catch (const failure &e) {
         throw failure(path + ": cannot write: " + e.what());
     }

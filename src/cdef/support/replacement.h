@@ -21,6 +21,9 @@ std::string temporary_of(const std::string &target);
 /* Removes the temporary file that a killed program has left for a target, but not one that is in use. */
 void remove_remains(const std::string &target);
 
+/* Waits until a file and its name are on the disk. A directory is a file, too. Throws failure, which names the path. */
+void sync_file(const std::string &path);
+
 struct replacement_options {
     bool sync = false; /* contents and name are on the disk before the function returns */
     /* What a program has read from the file and changed. If the file has other contents by now, or may not be written

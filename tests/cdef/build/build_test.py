@@ -402,3 +402,59 @@ def test_says_what_is_wrong_in_json_too(world):
     result = build(world, "--format=json", "missing", SOURCE)
     check(result.returncode == 2 and b"missing: cannot open" in result.stderr, result)
     json.loads(result.stdout)
+
+
+def test_says_in_each_form_which_database_could_not_be_written(world):
+    """A directory is in its place."""
+    world.path(OUT).mkdir()
+    why = f"{OUT}: cannot write: Is a directory"
+    for form, found in (("json", lambda said: said["sources"][0]["unwritten"]),
+                        ("gitlab", lambda said: [each["description"] for each in said]),
+                        ("sarif", lambda said: [each["message"]["text"] for each in
+                                                said["runs"][0]["invocations"][0]["toolExecutionNotifications"]])):
+        result = build(world, "--format", form, "-o", OUT, SOURCE)
+        expect(result, 2, f"cdef: {why}\n".encode(), result.stdout)
+        check(found(json.loads(result.stdout)) == [why], result.stdout)
+    result = build(world, "--format=github", "-o", OUT, SOURCE)
+    check(f"::error file={SOURCE}::{why}\n".encode() in result.stdout, result.stdout)
+
+
+# ---- Odd files -------------------------------------------------------------------------------------------------------
+
+
+def test_names_a_link_that_leads_nowhere(world):
+    """Each such link in a directory is reported; the other sources are built."""
+    sources(world, "in/a.cdefsrc")
+    world.path("in/b.cdefsrc").symlink_to("b.cdefsrc")
+    world.path("in/c.cdefsrc").symlink_to("nowhere")
+    world.path("in/d").symlink_to("d")
+    expect(build(world, "in"), 2, b"cdef: in/b.cdefsrc: cannot open because: Too many levels of symbolic links\n"
+           b"cdef: in/c.cdefsrc: cannot open because: No such file or directory\n"
+           b"cdef: 3 databases: 1 written, 0 unchanged, 2 not made\n")
+    check(files(world, "in") == ["a.cdef", "a.cdefsrc", "b.cdefsrc", "c.cdefsrc", "d"], files(world, "in"))
+
+
+def test_names_a_directory_that_cannot_be_read(world):
+    """Not the operand above it."""
+    if os.geteuid() == 0:
+        pytest.skip("root may read all directories")
+    sources(world, "in/a.cdefsrc", "in/no/b.cdefsrc")
+    world.path("in/no").chmod(0)
+    expect(build(world, "in"), 2, b"cdef: in/no: Permission denied\n")
+    world.path("in/no").chmod(0o700)
+
+
+def test_names_the_temporary_file_that_cannot_be_made(world):
+    """What is in its place is not a file of an earlier build, and stays."""
+    temporary = world.path(".out.cdef.cdef-new")
+    for make, remove, why in ((lambda: os.mkfifo(temporary), temporary.unlink, b"File exists"),
+                              (temporary.mkdir, temporary.rmdir, b"File exists"),
+                              (lambda: temporary.symlink_to("x"), temporary.unlink, b"Too many levels of symbolic links")):
+        make()
+        expect(build(world, "-o", OUT, SOURCE), 2, b"cdef: out.cdef: cannot write: .out.cdef.cdef-new: " + why + b"\n")
+        remove()
+
+
+def test_lists_no_name_with_a_newline(world):
+    """The list would be ambiguous."""
+    expect(build(world, "--list", "a", "b\nc.cdefsrc"), 2, b"cdef: --list: b\\nc.cdef: the name has a newline\n")

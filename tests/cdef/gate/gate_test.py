@@ -584,3 +584,11 @@ def test_document_has_the_rules():
     """The rules about numbers."""
     text = (PROJECT / "docs/gate.md").read_text()
     check(all(f"| `CMP40{number}` |" in text for number in range(1, 5)), "rules")
+
+
+def test_says_that_an_older_version_is_empty(world):
+    """It is neither a source nor a damaged database."""
+    write(world, "old/class.cdef", b"")
+    write(world, SOURCE, BASE)
+    for against in ("old", "old/class.cdef"):
+        expect(world.inspect("gate", "--against", against, SOURCE), 2, b"cdef: old/class.cdef: the file is empty\n")

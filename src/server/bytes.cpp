@@ -1,4 +1,4 @@
-/* bytes.cpp: where in a database the record of a stanza is. */
+/* bytes.cpp: where in a database the record of a stanza is, and what it refers to. */
 
 #include "server/bytes.h"
 
@@ -122,7 +122,53 @@ std::optional<std::size_t> element_offset(std::string_view source, const index &
     return in_table(fields, table, number - element.run, element.value(source, "ElementName"), sizeof(sd_field_t));
 }
 
+/* The strings that the record of a stanza refers to. */
+cdb::bytes strings_of(const cdb::database &db, const index &of, std::size_t number) {
+    const stanza &wanted = of.stanzas[number];
+    if (wanted.kind == SC_CLASS_TO_MANAGER_MAPPING)
+        return (*db.maps().begin()).strings();
+    if (wanted.kind == SC_RESOURCE_VARIABLE_CLASS) {
+        auto found = db.variable_classes().begin();
+        std::advance(found, ordinal_of(of, number, false));
+        return (*found).strings();
+    }
+    std::optional<class_place> in = class_of(db, wanted);
+    return in ? in->view.side_tables().strings : cdb::bytes();
+}
+
+/* The size of a value that is stored outside of its record, in bytes. */
+std::size_t size_of(const cdb::value &stored) {
+    switch (stored.type()) {
+    case VX_CHAR_PTR:
+        return stored.text().size() + 1;
+    case VX_BINARY_PTR:
+        return cdb::value::BINARY_BYTES + stored.binary().size();
+    case VX_RSRC_HANDLE_PTR:
+        return sizeof(vx_resource_handle_t);
+    case VX_SD_PTR:
+        return cdb::value::ELEMENTS + stored.elements().size() * sizeof(vx_structured_data_element_t);
+    default:
+        return cdb::value::ELEMENTS + stored.elements().size() * sizeof(vx_value_t);
+    }
+}
+
 } // namespace
+
+std::span<const std::byte> referred_bytes(const index &of, std::size_t number, std::span<const std::byte> image,
+                                          std::size_t record, const cdb::field &field) {
+    cdb::database db(image);
+    cdb::bytes file = db.file();
+    cdb::bytes strings = strings_of(db, of, number);
+    if (field.kind == cdb::field_kind::reference && field.to == cdb::target::strings) {
+        auto offset = file.number<std::uint32_t>(record + field.offset);
+        return offset == CDB_NONE ? std::span<const std::byte>()
+                                  : strings.part(offset, strings.text(std::uint64_t{offset}).size() + 1).raw();
+    }
+    if (field.kind != cdb::field_kind::value || field.type_at == cdb::TYPE_OF_OWNER)
+        return {};
+    cdb::value stored(file, record + field.offset, file.number<vx_data_type_t>(record + field.type_at), strings);
+    return stored.place() ? strings.part(*stored.place(), size_of(stored)).raw() : std::span<const std::byte>();
+}
 
 std::optional<std::size_t> record_offset(std::string_view source, const index &of, std::size_t number,
                                          std::span<const std::byte> image) {

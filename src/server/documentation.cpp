@@ -35,6 +35,9 @@ std::string names_of(const srtable_ctrl &kind, bool required) {
 /* "`rsrc_pattr_t`, `ra_attr_id`, 4 bytes from offset 56" for each field. */
 std::string fields_of(const srtable_ctrl &kind, const table_attrs &attr) {
     const cdb::record_format &record = language::record_of(kind);
+    if (attr.ta_type == AT_SD_INDEX)
+        return point("field", "none: it is the place of the element's " + language::quoted(record.record) + " in " +
+                                  language::quoted("sd_fields") + " of " + language::quoted("sd_def_t"));
     std::string text;
     for (std::size_t i = 0; i < record.facts.size(); ++i) {
         const cdb::field &field = record.fields[i];

@@ -20,21 +20,41 @@ struct shown {
     stretch at;
 };
 
+/* The number of the stanza in the index. */
+std::size_t number_of(const place_in_source &place) {
+    return static_cast<std::size_t>(place.stanza - place.in.index().stanzas.data());
+}
+
 /* Where the stanza's record is in the database, if the source compiles to one. */
 std::optional<std::size_t> offset_of_record(const place_in_source &place) {
     const compiled_source *made = place.in.compiled();
-    if (made == nullptr)
-        return std::nullopt;
-    auto number = static_cast<std::size_t>(place.stanza - place.in.index().stanzas.data());
-    return record_offset(place.text(), place.in.index(), number, made->image);
+    return made == nullptr ? std::nullopt
+                           : record_offset(place.text(), place.in.index(), number_of(place), made->image);
 }
 
 std::string at_offset(std::size_t offset) {
     return "offset " + text::hex(offset);
 }
 
-/* Name, offset and bytes of each field that the attribute fills. */
+constexpr const char *IN_DATABASE = "\n- in the database: ";
+
+/* part: of the image */
+std::string shown_bytes(std::span<const std::byte> image, std::span<const std::byte> part) {
+    return at_offset(static_cast<std::size_t>(part.data() - image.data())) + ", bytes `" + hexadecimal(part) + "`";
+}
+
+std::string record_place(const place_in_source &place) {
+    std::optional<std::size_t> record = offset_of_record(place);
+    if (!record)
+        return {};
+    return IN_DATABASE + ("at " + at_offset(*record)) + ", " +
+           std::to_string(language::record_of(place.stanza->row()).size) + " bytes";
+}
+
+/* Name, offset and bytes of each field that the attribute fills, and of what it refers to. */
 std::string bytes_of(const place_in_source &place) {
+    if (place.attribute->known->ta_type == AT_SD_INDEX)
+        return record_place(place);
     std::optional<std::size_t> record = offset_of_record(place);
     if (!record)
         return {};
@@ -47,18 +67,12 @@ std::string bytes_of(const place_in_source &place) {
         std::size_t size = std::size_t{field.width} * field.count;
         if (!language::fills(*place.attribute->known, format.facts[i]) || begin + size > image.size())
             continue;
-        text += "\n- in the database: " + language::quoted(field.name) + " at " + at_offset(begin) + ", bytes `" +
-                hexadecimal(image.subspan(begin, size)) + "`";
+        text += IN_DATABASE + language::quoted(field.name) + " at " + shown_bytes(image, image.subspan(begin, size));
+        auto referred = referred_bytes(place.in.index(), number_of(place), image, *record, field);
+        if (!referred.empty())
+            text += IN_DATABASE + language::quoted(field.name) + " refers to " + shown_bytes(image, referred);
     }
     return text;
-}
-
-std::string record_place(const place_in_source &place) {
-    std::optional<std::size_t> record = offset_of_record(place);
-    if (!record)
-        return {};
-    return "\n- in the database: at " + at_offset(*record) + ", " +
-           std::to_string(language::record_of(place.stanza->row()).size) + " bytes";
 }
 
 /* The item of a comma-separated list that contains an offset. */

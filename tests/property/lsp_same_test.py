@@ -14,7 +14,7 @@ import pytest
 
 import generate_sources
 from compare import none
-from lsp_client import CAPABILITIES, Client, position
+from lsp_client import CAPABILITIES, Client, position, units
 from programs import PROGRAMS
 
 COUNT = 400  # sources that all groups make together; script/proof asks for more
@@ -110,13 +110,33 @@ def test_findings_are_those_of_check(directory, group):
     none(wrong)
 
 
+def place_of(chooser, text, at, encoding):
+    """A position that means this place. Often it is one that does not exist: after the end of the line or of the text, or
+    inside the character that begins here."""
+    where = position(text, at, encoding)
+    next_one = text[at:at + 1]
+    if chooser.randrange(3):
+        return where
+    if not next_one and chooser.randrange(2):
+        return {"line": where["line"] + chooser.randrange(1, 9), "character": chooser.randrange(9)}
+    if next_one in ("", "\r", "\n"):
+        return {**where, "character": where["character"] + chooser.choice((1, 9, 2**31 - 1 - where["character"]))}
+    inside = units(next_one, encoding) - 1
+    return {**where, "character": where["character"] + chooser.randrange(inside + 1)}
+
+
 def edit(chooser, text, encoding):
-    """A change, and the text that results from it. It never separates a carriage return from its newline."""
+    """A change, and the text that results from it. No position is between a carriage return and its newline, but a change
+    may bring the two together."""
     begin, end = sorted(within_end(text, chooser.randrange(len(text) + 1)) for _ in range(2))
     end = within_end(text, min(end, begin + chooser.randrange(40)))
     end = max(begin, end)
+    newlines = [at for at, letter in enumerate(text) if letter == "\n"]
+    if newlines and chooser.randrange(8) == 0:
+        begin = end = within_end(text, chooser.choice(newlines))
     new = chooser.choice(("", "\n", "\r", "\r\n", "\t", "=", "\"", "Id", *LETTERS, text[begin:end] * 2, text[:30]))
-    change = {"range": {"start": position(text, begin, encoding), "end": position(text, end, encoding)}, "text": new}
+    start, stop = place_of(chooser, text, begin, encoding), place_of(chooser, text, end, encoding)
+    change = {"range": {"start": start, "end": stop}, "text": new}
     return change, text[:begin] + new + text[end:]
 
 

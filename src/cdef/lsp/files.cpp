@@ -15,8 +15,6 @@ namespace cdef {
 namespace {
 
 constexpr std::uintmax_t FILE_MAX = 64UL * 1024 * 1024; /* bytes */
-constexpr std::size_t SOURCES_MAX = 20'000;
-constexpr std::size_t ENTRIES_MAX = 500'000; /* files and folders that are looked at: about a second */
 
 } // namespace
 
@@ -32,13 +30,13 @@ std::optional<std::string> bytes_of_file(const std::string &path) {
     }
 }
 
-std::vector<std::string> sources_below(const std::string &folder) {
+std::vector<std::string> sources_below(const std::string &folder, const search_limits &limits) {
     using std::filesystem::recursive_directory_iterator;
     std::vector<std::string> found;
     std::error_code failed;
     recursive_directory_iterator end;
     recursive_directory_iterator at(folder, std::filesystem::directory_options::skip_permission_denied, failed);
-    for (std::size_t seen = 0; !failed && at != end && seen < ENTRIES_MAX && found.size() < SOURCES_MAX; ++seen) {
+    for (std::size_t seen = 0; !failed && at != end && seen < limits.entries && found.size() < limits.sources; ++seen) {
         std::error_code unknown;
         if (at->is_directory(unknown) && at->path().filename().native().starts_with('.'))
             at.disable_recursion_pending();

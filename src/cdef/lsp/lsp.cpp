@@ -35,7 +35,7 @@ class connection {
 public:
     explicit connection(const lsp_options &options)
         : server({.read = bytes_of_file,
-                  .sources_in = sources_below,
+                  .sources_in = [](const std::string &folder) { return sources_below(folder); },
                   .explanations = options.explanations.empty() ? explanations_page() : options.explanations,
                   .version = CDGEN_VERSION,
                   .project_file = options.project.none ? "" : options.project.file}) {}

@@ -7,7 +7,7 @@ import pytest
 
 from compare import same
 from lsp_client import CAPABILITIES, Client, ServerError, edited, edits_in, offset, part, position
-from programs import PROGRAMS
+from programs import PROGRAMS, environment
 
 URI = "file:///classes/Pump.cdefsrc"
 PUMP = """# A pump.
@@ -142,7 +142,7 @@ def compiled(text):
     with tempfile.TemporaryDirectory() as directory:
         source, output = pathlib.Path(directory, "Pump.cdefsrc"), pathlib.Path(directory, "Pump.cdef")
         source.write_text(text)
-        subprocess.run([PROGRAMS.cdgen, source, output], check=True, capture_output=True)
+        subprocess.run([PROGRAMS.cdgen, source, output], check=True, capture_output=True, env=environment())
         return output.read_bytes()
 
 
@@ -156,6 +156,39 @@ def test_hover_shows_the_bytes_of_every_kind_of_record(pump, words, number):
     raw = number.to_bytes(2, PROGRAMS.native)
     assert bytes.fromhex(shown) == raw
     assert compiled(PUMP)[int(begin, 16):int(begin, 16) + 2] == raw
+
+
+@pytest.mark.parametrize("words, field, stored", [
+    ("\tNa|me=Pump", "u_rc_name", b"Pump\0"), ("\tNa|me=Host", "u_ra_name", b"Host\0"),
+    ("\tNa|me=Speed", "u_ra_name", b"Speed\0"), ("\tNa|me=Stop", "u_ac_name", b"Stop\0"),
+    ("\tElementNa|me=Turns", "u_sd_field_name", b"Turns\0"), ("\tElementNa|me=When", "u_sd_field_name", b"When\0"),
+    ("\tVariableCl|ass=Flow\n\tObs", "u_rvc_name", b"Flow\0"), ("\tMessageCat|alog=m", "u_rcm_msg_file", b"m.cat\0"),
+    ("\tReArmExpr|ession", "u_ra_rearm_expr", b"Host == 'Host'\0"), ("\tDefaultVa|lue=", "ra_dflt_value", b"vier\0"),
+    ("\tInitialVal|ue=", "ra_init_value", b"\0\0\0\1\0\0\0\0\0\0\0\5\0\0\0\0"),
+    ("\tExpr|ession=", "u_ra_express", b"Speed.Turns > 9 && Speed.Turns < 99\0"),
+])
+def test_hover_shows_the_bytes_that_a_record_refers_to(pump, words, field, stored):
+    """Of a long text the first ones."""
+    text = PUMP.replace("\tProperties=Public,", "\tDefaultValue=vier\n\tProperties=Public,").replace(
+        "ResourceAction", "DynamicClassAttribute\n\tName=Total\n\tDescription=5\n\tDisplayName=6\n\tId=1\n"
+        "\tDataType=UInt32Array\n\tVarietyRange=1,1\n\tVariableType=Quantity\n\tInitialValue=5\nResourceAction")
+    show(pump, text)
+    about, _ = hover(pump, words, text)
+    found = re.search(f"`{field}` refers to offset 0x([0-9a-f]+), bytes `([0-9a-f ]+)( \\.\\.\\.)?`", about)
+    begin, shown = found.groups()[:2]
+    if field == "ra_init_value" and PROGRAMS.native == "little":
+        stored = b"".join(stored[at:at + 4][::-1] for at in range(0, len(stored), 4))
+    assert bytes.fromhex(shown) == stored[:16]
+    assert compiled(text)[int(begin, 16):int(begin, 16) + len(stored)] == stored
+
+
+def test_hover_on_the_index_of_an_element_shows_its_record(pump):
+    """The index is not stored."""
+    about, _ = hover(pump, "\tElementInd|ex=0\n\tDataType=UInt32\nResource")
+    assert "- field: none: it is the place of the element's `sd_field_t` in `sd_fields` of `sd_def_t`" in about
+    begin, size = re.search(r"- in the database: at offset 0x([0-9a-f]+), (\d+) bytes", about).groups()
+    name, _ = hover(pump, "\tElementNa|me=Turns")
+    assert f"`u_sd_field_name` at offset 0x{begin}," in name and size == "32"
 
 
 def test_hover_without_a_database_has_no_bytes(pump):
@@ -449,6 +482,32 @@ def test_rename_changes_nothing_else(pump, directory, words, old, new, count):
                            check=False)
     changed = shown.stdout.decode().splitlines()
     assert changed and all(old in line or new in line for line in changed if not line.startswith("~")), changed
+
+
+@pytest.mark.parametrize("words, old, new", [
+    ("VariableClass=Fl|ow", "Flow", "Tide"), ("Speed.Tu|rns >", "Turns", "Flips"), ("Name=Whe|n", "When", "Hour"),
+    ("Name=Spe|ed", "Speed", "Tempo"), ("Name=St|op", "Stop", "Halt"),
+])
+def test_rename_changes_only_the_name_in_the_database(pump, words, old, new):
+    """And the checksum, the second word of the file; here, nothing moves, because both names have the same length."""
+    before, after = compiled(PUMP), compiled(rename(pump, words, new))
+    assert before[:4] + before[8:] != after[:4] + after[8:]
+    same(after[:4] + after[8:], (before[:4] + before[8:]).replace(old.encode(), new.encode()), "the database")
+
+
+@pytest.mark.parametrize("words, new, lines_shown", [
+    ("VariableClass=Fl|ow", "Tide", ["- ResourceVariableClass 'Flow'", "+ ResourceVariableClass 'Tide'"]),
+    ("Speed.Tu|rns >", "Flips", [
+        "~ DynamicResourceAttribute 'Speed': expression 'Speed.Turns > 9 && Speed.Turns < 99' -> "
+        "'Speed.Flips > 9 && Speed.Flips < 99'",
+        "- DynamicResourceAttribute 'Speed', element 'Turns'", "+ DynamicResourceAttribute 'Speed', element 'Flips'"]),
+])
+def test_rename_as_a_difference(pump, directory, words, new, lines_shown):
+    """What `cdef diff` finds by its name is shown as removed and added."""
+    for name, text in (("a", PUMP), ("b", rename(pump, words, new))):
+        (directory / f"{name}.cdef").write_bytes(compiled(text))
+    shown = subprocess.run([PROGRAMS.cdef, "diff", "a.cdef", "b.cdef"], cwd=directory, capture_output=True, check=False)
+    same(shown.stdout.decode().splitlines(), lines_shown, "lines")
 
 
 @pytest.mark.parametrize("words, new, why", [

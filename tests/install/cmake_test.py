@@ -160,6 +160,30 @@ class Compile:
             self.build()
         self.assertIn("[CMP401]", str(failed.exception))
 
+    def git(self, *arguments):
+        who = {f"GIT_{role}_{what}": "someone@example.com" for role in ("AUTHOR", "COMMITTER") for what in ("NAME", "EMAIL")}
+        run("git", *arguments, cwd=self.here, env={**os.environ, **who, "GIT_CONFIG_GLOBAL": "/dev/null"})
+
+    def test_gate_notices_a_commit(self):
+        """What is compared with the last commit passes as soon as it is that commit."""
+        self.project("cdgen_compile(disk a.cdefsrc a.cdef GATE git:HEAD)", a=disk().read_bytes())
+        self.git("init", "-q", ".")
+        self.git("add", "a.cdefsrc")
+        self.git("commit", "-qm", "the first version")
+        self.build()
+        (self.here / "a.cdefsrc").write_bytes(disk().read_bytes().replace(b"Id=1\n", b"Id=77\n"))
+        later(self.here / "a.cdefsrc")
+        with self.assertRaises(AssertionError) as failed:
+            self.build()
+        self.assertIn("[CMP102]", str(failed.exception))
+        self.git("commit", "-qam", "the second version")
+        self.build()
+        self.git("checkout", "-q", "HEAD^", "--", ".")
+        self.git("commit", "-qm", "as before")
+        (self.here / "a.cdefsrc").write_bytes(disk().read_bytes().replace(b"Id=1\n", b"Id=77\n"))
+        with self.assertRaises(AssertionError):
+            self.build()
+
     def test_project_file_builds_again(self):
         (self.here / "cdef.toml").write_text("")
         odd = disk().read_bytes().replace(b"Id=1\n", b"Id=010\n")

@@ -68,6 +68,29 @@ class Hooks(Case):
         self.assertEqual(status, 1, said)
         self.assertIn("Id 1 -> 77 (readers know it by its number) [CMP102]", said)
 
+    def commit_all(self):
+        """The status and the output of a commit with the installed hooks."""
+        done = subprocess.run(["git", "commit", "-qam", "a change"], cwd=self.project, env=self.environment, text=True,
+                              stdout=subprocess.PIPE, stderr=subprocess.STDOUT, check=False)
+        return done.returncode, done.stdout
+
+    def test_commit_with_installed_hooks(self):
+        """A sound change is committed, and one that breaks others or has a mistake is not."""
+        run("pre-commit", "install", cwd=self.project, env=self.environment)
+        first = self.git(self.project, "rev-parse", "HEAD")
+        self.source.write_bytes(self.source.read_bytes() + b"# a comment\n")
+        status, said = self.commit_all()
+        self.assertEqual(status, 0, said)
+        second = self.git(self.project, "rev-parse", "HEAD")
+        self.assertNotEqual(first, second)
+        for old, new, why in ((b"Id=1\n", b"Id=77\n", "[CMP102]"), (b"UInt32", b"Uint32", "Invalid data type")):
+            self.change(old, new)
+            status, said = self.commit_all()
+            self.assertNotEqual(status, 0, said)
+            self.assertIn(why, said)
+            self.assertEqual(self.git(self.project, "rev-parse", "HEAD"), second)
+            self.git(self.project, "checkout", "-q", "HEAD", "--", ".")
+
     def test_stop_a_commit_in_a_linked_worktree(self):
         run("pre-commit", "install", cwd=self.project, env=self.environment)
         linked = self.here / "linked"

@@ -141,6 +141,8 @@ int build_all(const build_options &options) {
     signal(SIGXFSZ, SIG_IGN); /* writing to a closed pipe or beyond a size limit then fails with an error instead of a
                                * signal */
     signal(SIGPIPE, SIG_IGN);
+    if (options.depfile)
+        remove_remains(target_of(*options.depfile));
     for (const std::string &directory : directories)
         make_directory(directory, options.sync);
     build_run run(

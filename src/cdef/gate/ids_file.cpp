@@ -43,7 +43,10 @@ std::vector<check::finding> ids_file::accept(const std::vector<gate::numbered> &
 }
 
 void ids_file::save() const {
-    if (std::string now = recorded.text(); now != before)
+    std::string now = recorded.text();
+    if (now == before)
+        remove_remains(target_of(path));
+    else
         replace_file(
             path, now,
             {.before = is_there ? std::optional<std::string_view>(before) : std::nullopt, .must_be_new = !is_there});

@@ -10,6 +10,7 @@
 #include <array>
 #include <cerrno>
 #include <climits>
+#include <csignal>
 #include <cstdint>
 #include <cstdio>
 #include <cstring>
@@ -235,6 +236,12 @@ void replace_target(const std::string &target, std::string_view contents, const 
         sync_directory(target);
 }
 
+/* Writing beyond a limit for the size of files then fails with an error. The signal would end the program with the
+ * temporary file in place. */
+void ignore_size_limit_signal() {
+    [[maybe_unused]] static const auto former = signal(SIGXFSZ, SIG_IGN);
+}
+
 /* Enough to distinguish names with the same beginning. */
 std::uint64_t hash_of(std::string_view text) {
     std::uint64_t hash = 14695981039346656037U; /* FNV-1a */
@@ -288,6 +295,7 @@ void sync_file(const std::string &path) {
 
 void replace_file(const std::string &path, std::string_view contents, const replacement_options &options) {
     std::string target = target_of(path);
+    ignore_size_limit_signal();
     try {
         replace_target(target, contents, options);
     } catch (const step_failed &step) {

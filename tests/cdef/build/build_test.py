@@ -254,6 +254,31 @@ def test_warns_of_classes_that_contradict_each_other(world):
         expect(world.inspect("check", "--werror", source), 0)
 
 
+def test_warns_of_managers_and_variable_classes_that_contradict_each_other(world):
+    """With the place in each source."""
+    variables = b"ResourceVariableClass\n\tVariableClass=V\n\tObservationInterval=%d\n\tReportingInterval=60\n"
+    world.write("a.cdefsrc", HEAD + variables % 5)
+    other = HEAD.replace(b"Name=Disk", b"Name=Tape").replace(b"=Mgr1", b"=Mgr2").replace(b"FirstKey=1\n", b"FirstKey=101\n")
+    world.write("b.cdefsrc", other.replace(b"LastKey=100", b"LastKey=200") + variables % 6)
+    expect(build(world, "--no-warn=unused-variable-class", "a.cdefsrc", "b.cdefsrc"), 0,
+           b"b.cdefsrc:11:18: warning: classes with the message catalog `mgr1.cat` have the manager `Mgr2` here and `Mgr1` in "
+           b"a.cdefsrc:11 [S613 other-manager]\n"
+           b"   11 | \tResourceManager=Mgr2\n"
+           b"      | \t                ^~~~\n"
+           b"b.cdefsrc:17:16: warning: the variable class `V` has other intervals or another alias than in a.cdefsrc:17 "
+           b"[S614 other-variable-class]\n"
+           b"   17 | \tVariableClass=V\n"
+           b"      | \t              ^\n"
+           b"0 errors and 2 warnings in 1 of 2 sources\n"
+           b"cdef: 2 databases: 2 written, 0 unchanged, 0 not made\n")
+
+
+def test_compares_no_numbers_of_different_classes(world):
+    """The Id of an attribute belongs to its class."""
+    sources(world, "a.cdefsrc", "b.cdefsrc", text=HEAD + attributes(2))
+    expect(build(world, "--werror", "a.cdefsrc", "b.cdefsrc"), 0, b"cdef: 2 databases: 2 written, 0 unchanged, 0 not made\n")
+
+
 def test_sarif_has_the_place_of_the_other_class(world):
     world.write("a.cdefsrc", HEAD)
     world.write("b.cdefsrc", HEAD.replace(b"Name=Disk", b"Name=Tape"))

@@ -185,7 +185,7 @@ constexpr form_row forms[] = {
     {AT_ACTION_PROPS, NAMES},
     {AT_VERSION, {"version", "up to four decimal numbers with `.` between"}},
     {AT_VARIETY, {"low,high", "two integers with one `,`"}},
-    {AT_RANGE, {"two values with ,: low,high", "two values of the attribute's own data type with `,`"}},
+    {AT_RANGE, {"two values, low,high", "both of the attribute's own data type"}},
     {AT_DATA_TYPE, TYPE},
     {AT_SD_DATA_TYPE, TYPE},
     {AT_VARIABLE_TYPE, {"Counter, Quantity, State or Quantum", "the name of a variable type"}},

@@ -10,6 +10,7 @@ import subprocess
 import unittest
 
 from documents import DOCUMENTS, PAGES, PROJECT, chapters, sources, spans, tables, text_of
+from lsp_client import Client
 from programs import PROGRAMS
 
 LANGUAGE, FORMAT = PROJECT / "docs/language.md", PROJECT / "docs/format.md"
@@ -85,6 +86,22 @@ class Language(Names):
             known[stanza][name] = ("yes" if needed == "required" else "no", "yes" if often == "repeats" else "no",
                                    " ".join(form))
         self.assertEqual(said, known)
+
+    def test_attributes_are_in_their_usual_order(self):
+        """That of `cdef format --reorder`, which the language server shows."""
+        with Client() as client:
+            for number, (kind, rows) in enumerate(self.stanza_chapters().items()):
+                uri = f"file:///{number}.cdefsrc"
+                client.open(uri, kind + "\n")
+                shown = client.at("textDocument/hover", uri, 0, 0)["contents"]["value"].splitlines()
+                usual = [line for line in shown if line.startswith(("- required: ", "- optional: "))]
+                self.assertEqual([name for row in rows[1:] for name in spans(row[0])], spans("".join(usual)), kind)
+
+    def test_whole_class_is_in_the_usual_order(self):
+        (source,) = re.findall(r"```\n(.*?)```", dict(chapters(LANGUAGE, 2))["A whole class"], re.S)
+        formatted = [subprocess.run([PROGRAMS.cdef, "format", *options, "-"], input=source, capture_output=True, text=True,
+                                    check=True).stdout for options in ((), ("--reorder",))]
+        self.assertEqual(formatted[0], formatted[1])
 
     def test_list_of_stanzas_is_complete(self):
         listed = [name for row in tables(dict(chapters(LANGUAGE, 2))["Stanzas"].split("###")[0])[0][1:]

@@ -37,7 +37,8 @@ inline constexpr std::array<meanings, 11> statuses = {{
     {"new", "the source is written", "",
      "the source exists or cannot be written, or a source cannot give a class this name"},
     {"explain", "the codes are explained", "", "there is no such code"},
-    {"lsp", "the client has shut the server down", "the client has ended without shutting the server down",
+    {"lsp", "the client has shut the server down and ended it",
+     "the client or its input has ended without that, or the header of a message is wrong",
      "standard input cannot be read"},
 }};
 

@@ -1,21 +1,55 @@
 """Test what script/proof records."""
 
 import json
+import subprocess
 
 from scripts import script
 
 PROOF = script("proof")
 
 
+def recorded(sources):
+    """What is recorded for these sources."""
+    return PROOF.recorded(dict.fromkeys(PROOF.STEPS, sources))
+
+
 def test_what_is_done_counts_for_its_sources_only(directory, monkeypatch):
     """Portions of other sources, and of steps that no longer exist, are not counted."""
     monkeypatch.setattr(PROOF, "DONE", directory / "done.jsonl")
-    assert PROOF.recorded("now")["sources"] == {}
+    assert recorded("now")["sources"] == {}
     records = [{"step": step, "portion": portion, "sources": sources}
                for step, portion, sources in (("sources", 3, "now"), ("sources", 4, "before"), ("gone", 0, "now"))]
     PROOF.DONE.write_text("".join(json.dumps(record) + "\n" for record in records))
-    done = PROOF.recorded("now")
+    done = recorded("now")
     assert [list(done[name]) for name in ("sources", "check")] == [[3], []]
+
+
+def test_only_the_sources_of_a_step_count(directory, monkeypatch):
+    """Other changes do not: what was run remains."""
+    def git(*words):
+        subprocess.run(["git", "-c", "user.name=x", "-c", "user.email=x", *words], cwd=directory, check=True,
+                       stdout=subprocess.DEVNULL)
+
+    monkeypatch.setattr(PROOF, "PROJECT", directory)
+    (directory / "mine.cpp").write_text("1")
+    (directory / "other.cpp").write_text("1")
+    git("init", "-q")
+    git("add", ".")
+    git("commit", "-q", "-m", "x")
+    step = PROOF.Step("", "", 1, 1, "", ("mine.cpp",))
+    before = PROOF.version(step)
+    (directory / "other.cpp").write_text("2")
+    assert PROOF.version(step) == before
+    (directory / "mine.cpp").write_text("2")
+    changed = PROOF.version(step)
+    git("commit", "-q", "-a", "-m", "y")
+    assert len({before, changed, PROOF.version(step)}) == 3
+
+
+def test_every_directory_exists():
+    """Otherwise changes would go unnoticed."""
+    for step in PROOF.STEPS.values():
+        assert all((PROOF.PROJECT / each).is_dir() for each in step.sources)
 
 
 def test_portions_add_up():
@@ -34,5 +68,5 @@ def test_failure_is_not_recorded(directory, monkeypatch, capsys):
     assert not PROOF.run("bad", 0, "now")
     assert "failed with status 1: broken" in capsys.readouterr().out
     assert PROOF.run("good", 1, "now")
-    assert PROOF.recorded("now")["good"][1]["said"] == "1 passed"
-    assert PROOF.recorded("now")["bad"] == {}
+    assert recorded("now")["good"][1]["said"] == "1 passed"
+    assert recorded("now")["bad"] == {}

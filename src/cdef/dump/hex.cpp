@@ -11,6 +11,7 @@
 
 #include <array>
 #include <charconv>
+#include <cstdint>
 
 namespace cdef::dump {
 
@@ -126,7 +127,7 @@ void append_number(std::string &to, std::uint64_t number) {
 }
 
 /* At least eight digits. */
-void append_offset(std::string &to, std::size_t offset) {
+void append_offset(std::string &to, std::uint64_t offset) {
     constexpr int DIGIT = 4;
     int shift = 28;
     while (shift < 60 && offset >> (shift + DIGIT) != 0)

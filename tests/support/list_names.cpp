@@ -18,14 +18,17 @@
 #include "language/meanings.h"
 
 #include <cstdio>
+#include <string>
+#include <string_view>
 
 namespace {
 
 /* "KIND NAME text", without line breaks. */
 void list_meaning(const char *of, std::string_view name, std::string_view text, std::string_view without = {}) {
-    std::printf("meaning %s %.*s %.*s%s%.*s\n", of, static_cast<int>(name.size()), name.data(),
-                static_cast<int>(text.size()), text.data(), without.empty() ? "" : "; without this line ",
-                static_cast<int>(without.size()), without.data());
+    std::string line = std::string("meaning ").append(of).append(" ").append(name).append(" ").append(text);
+    if (!without.empty())
+        line.append("; without this line ").append(without);
+    std::puts(line.c_str());
 }
 
 void list_stanzas() {

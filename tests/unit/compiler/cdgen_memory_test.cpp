@@ -50,7 +50,7 @@ TEST_F(LargeTables, GrowOnTheHeapWhereAddressSpaceIsLimited) {
     rlimit before = {};
     ASSERT_EQ(getrlimit(RLIMIT_AS, &before), 0);
     rlimit limited = before;
-    limited.rlim_cur = rlim_t{1} << (8 * sizeof(size_t) - 3);
+    limited.rlim_cur = rlim_t{1} << (8 * sizeof(rlim_t) - 3);
     if (setrlimit(RLIMIT_AS, &limited) != 0)
         GTEST_SKIP() << "no limit can be set";
     tbl t(8192, "Records");

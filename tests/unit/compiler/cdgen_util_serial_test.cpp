@@ -493,7 +493,7 @@ TEST(Pools, UseTheLatestChunkAgain) {
 TEST(Pools, SayWhenThereIsNoMemory) {
     text_pool pool;
     char *taken = pool.take(8);
-    EXPECT_EQ(pool.take(size_t{1} << (sizeof(size_t) > 4 ? 62 : 31)), nullptr);
+    EXPECT_EQ(pool.take(static_cast<size_t>(sizeof(size_t) > 4 ? uint64_t{1} << 62 : 0xF000'0000)), nullptr);
     EXPECT_EQ(pool.take(8), taken + 8); /* and go on */
 }
 

@@ -23,8 +23,8 @@ using namespace util_test;
 
 namespace {
 
-/* Bytes that no process can have beside its own, and a power of 2 as single precision wants it. */
-constexpr size_t ABSURD = size_t{1} << (sizeof(size_t) > 4 ? 62 : 31);
+/* More bytes than a process can get, as a number that single precision holds exactly. */
+constexpr auto ABSURD = static_cast<size_t>(sizeof(size_t) > 4 ? uint64_t{1} << 62 : 0xF000'0000);
 
 /* New memory is filled with other bytes than zeros, so that a byte that is not cleared is noticed. */
 class Tables : public testing::Test {

@@ -87,6 +87,9 @@ TEST(SourceTexts, NumbersThatWouldUnderflowAreHexadecimal) {
 }
 
 TEST(SourceTexts, ASignallingNanHasNone) {
+#ifdef __i386__
+    GTEST_SKIP() << "a function that returns a signalling NaN returns a quiet one here";
+#endif
     EXPECT_EQ(texts_of(cell<std::uint64_t>(VX_FLOAT64, 0x7FF0000000000001), false), texts());
     EXPECT_EQ(texts_of(cell<std::uint64_t>(VX_FLOAT64, 0x7FF8000000000000), false), texts{"nan"});
 }

@@ -165,12 +165,15 @@ void collector::add_missing_lines() {
 
 /* Whether the elements in front of one in its run have their right numbers. Otherwise theirs are corrected first. */
 bool follows_right_elements(document &in, const source_index::stanza &element) {
-    const std::vector<source_index::stanza> &all = in.index().stanzas;
-    return std::all_of(all.begin(), all.end(), [&](const source_index::stanza &each) {
-        bool is_before = each.run == element.run && each.run != source_index::NONE && &each < &element;
-        return !is_before || each.value(in.text(), "ElementIndex") ==
-                                 example_value(in.text(), in.index(), each, *find_attr(each.row(), "ElementIndex"));
-    });
+    std::size_t number = 0;
+    for (const source_index::stanza &each : in.index().stanzas) {
+        if (&each == &element)
+            return true;
+        bool is_in_run = each.run == element.run && each.run != source_index::NONE;
+        if (is_in_run && each.value(in.text(), "ElementIndex") != std::to_string(number++))
+            return false;
+    }
+    return true;
 }
 
 void collector::add_free_number() {

@@ -5,6 +5,7 @@
 #include "language/names.h"
 
 #include <algorithm>
+#include <set>
 
 namespace lsp {
 
@@ -26,15 +27,15 @@ std::string new_name(std::string_view source, const source_index::index &of, con
 
 /* A variable class that dynamic attributes use but nothing defines; empty: there is none. */
 std::string undefined_variable_class(std::string_view source, const source_index::index &of) {
-    auto is_defined = [&](std::string_view name) {
-        return std::any_of(of.stanzas.begin(), of.stanzas.end(), [&](const source_index::stanza &each) {
-            return each.kind == SC_RESOURCE_VARIABLE_CLASS && each.value(source, "VariableClass") == name;
-        });
-    };
+    std::set<std::string_view> defined;
     for (const source_index::stanza &each : of.stanzas)
-        if (std::string_view name = each.is_known() ? each.value(source, "VariableClass") : ""; !name.empty())
-            if (!is_defined(name))
-                return std::string(name);
+        if (each.kind == SC_RESOURCE_VARIABLE_CLASS)
+            defined.insert(each.value(source, "VariableClass"));
+    for (const source_index::stanza &each : of.stanzas) {
+        std::string_view used = each.is_known() ? each.value(source, "VariableClass") : std::string_view();
+        if (!used.empty() && !defined.contains(used))
+            return std::string(used);
+    }
     return {};
 }
 

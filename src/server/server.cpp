@@ -121,7 +121,7 @@ void server::refuse(const json &id, error_code code, std::string_view text) {
 void server::receive(const frame &message) {
     switch (message.state) {
     case frame_state::bad_header:
-        refuse(nullptr, PARSE_ERROR, "not a header with a Content-Length");
+        refuse(nullptr, PARSE_ERROR, "not a header with a usable Content-Length");
         status = 1;
         return;
     case frame_state::too_large:

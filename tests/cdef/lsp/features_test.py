@@ -1,11 +1,12 @@
 """Test what `cdef lsp` offers at a place of a class."""
 
+import json
 import re
 import subprocess
 
 import pytest
 
-from compare import same
+from compare import none, same
 from lsp_client import CAPABILITIES, Client, ServerError, edited, edits_in, offset, part, position
 from programs import PROGRAMS, environment
 
@@ -224,6 +225,27 @@ def test_hover_shows_a_stanza(pump):
 ])
 def test_range_of_a_hover_contains_the_place(pump, words, shown):
     assert hover(pump, words)[1] == shown
+
+
+PLACES = (PUMP.replace("=Flow", '="Flow" # c', 1).replace("Locator=", "Locator= ").replace("Public,Reqd", '"Public,Reqd')
+          .replace("ForDefine\n", 'ForDefine"\n', 1).replace("FirstKey=1", " FirstKey = 1 ").replace("Name=Stop", "Name=")
+          + "Nonsense\n\tName=\u03b1\U0001d50a\n\n  \nResourceAction \n\t\n\tN\n")
+
+
+def test_ranges_contain_the_place_everywhere(pump):
+    """Those of hovers and, as the protocol demands, in one line, those of completion."""
+    show(pump, PLACES)
+    wrong = []
+    for number, line in enumerate(PLACES.split("\n")):
+        for character in range(len(line.encode("utf-16-le")) // 2 + 1):
+            where = {"line": number, "character": character}
+            ranges = [each["textEdit"]["range"] for each in at(pump, "textDocument/completion", where)]
+            found = at(pump, "textDocument/hover", where)
+            for each in [*ranges, *([found["range"]] if found else [])]:
+                begin, end = each["start"], each["end"]
+                if not begin["line"] == number == end["line"] or not begin["character"] <= character <= end["character"]:
+                    wrong.append((line, character, each))
+    none(wrong)
 
 
 def test_hover_is_silent_in_comments_and_unknown_lines(pump):
@@ -751,15 +773,34 @@ def test_client_without_literal_actions_gets_none():
             "start": {"line": 0, "character": 0}, "end": {"line": 99, "character": 0}}) == []
 
 
-def test_every_edit_of_every_finding_is_offered(pump):
-    """Those of `cdef check --format json`."""
+def corrected(text, edits):
+    """The text after edits as `cdef check --format json` has them, which count bytes."""
+    begins = [0]
+    for line in text.split("\n"):
+        begins.append(begins[-1] + len(line) + 1)
+    for each in sorted(edits, key=lambda one: (one["line"], one["column"]), reverse=True):
+        begin = begins[each["line"] - 1] + each["column"] - 1
+        assert text[begin:].startswith(each["removed"])
+        text = text[:begin] + each["inserted"] + text[begin + len(each["removed"]):]
+    return text
+
+
+def test_every_edit_of_every_finding_is_offered(pump, directory):
+    """And no other: those of `cdef check --format json`."""
     text = (PUMP.replace("FirstKey", "FirstKy").replace("=String", "=Strin").replace("\tName=Stop", "    \tName =Stop")
-            .replace("LastKey=2", "LastKey=2\r"))
+            .replace("LastKey=2", "LastKey=2\r").replace("\tId=7", "Id=7"))
+    (directory / "a.cdefsrc").write_bytes(text.encode())
+    done = subprocess.run([PROGRAMS.cdef, "check", "--format", "json", "a.cdefsrc"], cwd=directory, capture_output=True,
+                          check=False)
+    findings = [each for each in json.loads(done.stdout)["sources"][0]["findings"] if each["fix"]]
     show(pump, text)
     found = pump.about("textDocument/codeAction", URI, context={"diagnostics": [], "only": ["quickfix"]}, range={
         "start": {"line": 0, "character": 0}, "end": {"line": 999, "character": 0}})
-    assert sorted(each["diagnostics"][0]["code"] for each in found if "diagnostics" in each)
-    assert len([each for each in found if "diagnostics" in each]) >= 3
+    offered = [(each["diagnostics"][0]["code"], edited(text, edits_in(each["edit"])[URI]), each.get("isPreferred", False))
+               for each in found if "diagnostics" in each]
+    assert len(findings) >= 5
+    same(offered, [(each["code"], corrected(text, each["fix"]["edits"]), each["fix"]["certainty"] == "certain")
+                   for each in findings], "offers")
 
 
 def test_utf_8_edits():

@@ -87,18 +87,25 @@ def test_neovim(place):
 
 
 def test_neovim_completes_the_header_of_a_stanza(place):
-    """Neovim 0.7 would insert the newlines of the required lines as zero bytes."""
+    """Neovim 0.7 would insert the newlines of the required lines as zero bytes. A code action adds the lines."""
     nvim = Neovim(place)
     try:
         nvim.expect("luaeval('(vim.diagnostic.get(0)[1] or { message = \"\" }).message')", MESSAGE)
         nvim.type("Go<C-u>ResourceV<C-x><C-o>")
         nvim.expect("getline('$')", "ResourceVariableClass")
-        nvim.type("<C-y><Esc>:write<CR>:quitall!<CR>")
+        nvim.type("<C-y><Esc>:write<CR>")
+        nvim.expect("&modified", "0")
+        same((place / "pump.cdefsrc").read_text(), BEFORE + "ResourceVariableClass\n", "source")
+        nvim.type(":lua vim.ui.select = function(offers, _, choose) choose(offers[1]) end<CR>")
+        nvim.type(":lua vim.lsp.buf.code_action()<CR>")
+        nvim.expect("trim(getline('$'))", "ReportingInterval=0")
+        nvim.type(":write<CR>:quitall!<CR>")
         same(nvim.process.wait(WAIT), 0, "status")
     finally:
         nvim.process.kill()
         nvim.process.wait()
-    same((place / "pump.cdefsrc").read_text(), BEFORE + "ResourceVariableClass\n", "source")
+    lines = "\tVariableClass=NewVariableClass\n\tObservationInterval=0\n\tReportingInterval=0\n"
+    same((place / "pump.cdefsrc").read_text(), BEFORE + "ResourceVariableClass\n" + lines, "source")
 
 
 def test_emacs(place):

@@ -58,9 +58,11 @@ std::string value_note(const table_attrs &attr, vx_data_type_t type, std::string
         return name + " takes two bounds: " + line_of(attr.ta_name, "low,high");
     if (takes_two && commas > 1)
         return name + " takes one value, or two bounds with a comma between them: write a line for each value";
+    if (!takes_two && commas > 0 && is_vx_array(type) == 0)
+        return name + " takes one value, not a list";
     if (!takes_two && commas > 0)
-        return name + (is_vx_array(type) != 0 ? " takes one element of the array: write a line for each element"
-                                              : " takes one value, not a list");
+        return name + " takes one element of the array" +
+               (attr.dup_allowed != 0 ? ": write a line for each element" : ", and there is only one such line");
     return quoted(vxTypeStr[type]) + " takes " + form_of(type);
 }
 

@@ -20,6 +20,8 @@ TEST(ValueNote, SpeaksOfTheCommasOfAList) {
     EXPECT_EQ(note("DefaultValue", VX_UINT32, "1,2,3", kind), "`DefaultValue` takes one value, not a list");
     EXPECT_EQ(note("DefaultValue", VX_UINT32_ARRAY, "1,2,3", kind),
               "`DefaultValue` takes one element of the array: write a line for each element");
+    EXPECT_EQ(note("InitialValue", VX_UINT32_ARRAY, "1,2,3"),
+              "`InitialValue` takes one element of the array, and there is only one such line");
     EXPECT_EQ(
         note("ValidStateValue", VX_INT32, "1,2,3"),
         "`ValidStateValue` takes one value, or two bounds with a comma between them: write a line for each value");

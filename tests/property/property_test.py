@@ -32,7 +32,7 @@ from compare import none
 from programs import PROGRAMS
 
 GROUPS = 40
-CASES = 20000  # sources that all groups have together
+CASES = 10000  # sources that all groups have together
 SANITIZED_CASES = 2000
 MUTATIONS = 2  # of each source
 CATALOGUED = 2000  # sources that have everything between them

@@ -1,6 +1,6 @@
 """Test that `cdef check` takes at most 8 times the source and 16 MB, however much is wrong, in every form.
 
-WRONG_LINES is how many lines are wrong: 300,000 where nothing is said, 10,000,000 in script/proof. The limit is one of
+WRONG_LINES is how many lines are wrong: 100,000 where nothing is said, 10,000,000 in script/proof. The limit is one of
 the address space, so that nothing depends on what else the machine does.
 """
 
@@ -12,7 +12,7 @@ from bounded import run_bounded
 from compare import same
 from programs import PROGRAMS
 
-LINES = int(os.environ.get("WRONG_LINES", "300000"))
+LINES = int(os.environ.get("WRONG_LINES", "100000"))
 
 SOURCES = {
     "unknown-headers": ("", "x\n"),

@@ -132,7 +132,7 @@ struct knowledge {
     stanza_record &stanza() {
         return stanzas[index_of(kind)];
     }
-    /* The later of the two that a class begins with. */
+    /* The later one of ControlDefinition and ResourceClass, with which a class begins. */
     const stanza_record &class_stanza() const {
         const stanza_record &first = stanzas[SC_CONTROL_DEFINITION];
         const stanza_record &second = stanzas[SC_RESOURCE_CLASS];

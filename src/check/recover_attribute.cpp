@@ -216,7 +216,7 @@ bool recovery::is_misplaced(const fatal_exit &failure) {
     return again;
 }
 
-/* ---- What an error leaves to be done, besides its stanza's being broken ----------------------------------------- */
+/* ---- What an error leaves to be done ---------------------------------------------------------------------------- */
 
 void recovery::recover_value(const fatal_exit &failure, bool consequence) {
     if (failure.id == MSG_INDEX_NOT_CONSECUTIVE) {

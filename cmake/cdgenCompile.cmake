@@ -66,6 +66,11 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
   if(DEFINED arg_UNPARSED_ARGUMENTS OR DEFINED arg_KEYWORDS_MISSING_VALUES)
     message(FATAL_ERROR "cdgen_compile: cannot read \"${arg_UNPARSED_ARGUMENTS}${arg_KEYWORDS_MISSING_VALUES}\"")
   endif()
+  foreach(word IN ITEMS BYTE_ORDER GATE) # a variable that is not set must not switch a check off
+    if(word IN_LIST ARGN AND "${arg_${word}}" STREQUAL "")
+      message(FATAL_ERROR "cdgen_compile: ${word} has no value")
+    endif()
+  endforeach()
   if(DEFINED arg_BYTE_ORDER AND NOT arg_BYTE_ORDER MATCHES "^(native|little|big|both)$")
     message(FATAL_ERROR "cdgen_compile: BYTE_ORDER is native, little, big or both, not \"${arg_BYTE_ORDER}\"")
   endif()
@@ -113,6 +118,7 @@ function(cdgen_compile TARGET SOURCE OUTPUT)
     set(gate "cdgen_gate_${hash}")
     add_custom_target("${gate}"
       COMMAND "$<TARGET_FILE:cdgen::cdef>" gate "--against=${arg_GATE}" "${config}" ${strict} -- "${SOURCE}"
+      DEPENDS "${SOURCE}"
       VERBATIM)
   endif()
 

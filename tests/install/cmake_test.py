@@ -160,6 +160,28 @@ class Compile:
             self.build()
         self.assertIn("[CMP401]", str(failed.exception))
 
+    def test_gate_waits_for_a_source_that_is_made(self):
+        """It is compared as it has become, the first time and later."""
+        self.project("add_custom_command(OUTPUT made.cdefsrc DEPENDS a.cdefsrc VERBATIM\n"
+                     "  COMMAND ${CMAKE_COMMAND} -E copy ${CMAKE_CURRENT_SOURCE_DIR}/a.cdefsrc made.cdefsrc)\n"
+                     "cdgen_compile(disk ${CMAKE_CURRENT_BINARY_DIR}/made.cdefsrc a.cdef GATE old.cdefsrc)",
+                     a=disk().read_bytes(), old=disk().read_bytes())
+        self.build("--parallel", "4")
+        before = self.made("a.cdef")
+        (self.here / "a.cdefsrc").write_bytes(disk().read_bytes().replace(b"Id=1\n", b"Id=77\n"))
+        later(self.here / "a.cdefsrc")
+        with self.assertRaises(AssertionError) as failed:
+            self.build("--parallel", "4")
+        self.assertIn("[CMP102]", str(failed.exception))
+        self.assertEqual(self.made("a.cdef"), before)
+
+    def test_empty_words_are_refused(self):
+        """A variable that is not set does not switch a check off."""
+        for word in ("GATE", "BYTE_ORDER"):
+            with self.assertRaises(AssertionError) as failed:
+                self.project(f"cdgen_compile(disk a.cdefsrc a.cdef NO_TIMESTAMP {word} \"${{NEVER_SET}}\")", a=disk().read_bytes())
+            self.assertIn(f"cdgen_compile: {word} has no value", str(failed.exception))
+
     def git(self, *arguments):
         who = {f"GIT_{role}_{what}": "someone@example.com" for role in ("AUTHOR", "COMMITTER") for what in ("NAME", "EMAIL")}
         run("git", *arguments, cwd=self.here, env={**os.environ, **who, "GIT_CONFIG_GLOBAL": "/dev/null"})

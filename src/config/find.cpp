@@ -26,13 +26,22 @@ std::string seen_from_here(const fs::path &path) {
     return (error ? path : near).string();
 }
 
+/* True if there may be a project file of this name. What the system refuses to tell is found out when the file is read;
+ * but a directory that this user may not search counts as one without a project file. */
+bool may_be_file(const fs::path &candidate) {
+    std::error_code error;
+    fs::file_status named = fs::symlink_status(candidate, error);
+    if (named.type() == fs::file_type::none)
+        return error != std::errc::permission_denied;
+    return fs::exists(named) && !fs::is_directory(candidate, error);
+}
+
 } // namespace
 
 std::string find(const std::string &source) {
-    std::error_code error;
     for (fs::path at = directory_of(source); !at.empty(); at = at.parent_path()) {
         fs::path candidate = at / FILE_NAME;
-        if (fs::exists(fs::symlink_status(candidate, error)) && !fs::is_directory(candidate, error))
+        if (may_be_file(candidate))
             return seen_from_here(candidate);
         if (at == at.parent_path())
             break;

@@ -90,6 +90,7 @@ std::vector<std::string> without_repetitions(const std::vector<std::string> &sou
 void require_separate_files(const std::vector<build::unit> &units, const std::optional<std::string> &depfile) {
     inputs read(units);
     std::map<std::string, const std::string *> makers;
+    std::vector<std::string> written;
     for (const build::unit &each : units)
         for (const build::output &made : each.outputs) {
             if (made.path == STANDARD_STREAM)
@@ -98,12 +99,20 @@ void require_separate_files(const std::vector<build::unit> &units, const std::op
             auto [at, is_new] = makers.emplace(place_of(target_of(made.path)), &each.source);
             if (!is_new)
                 throw failure(made.path + ": it would be built from " + *at->second + " and from " + each.source);
+            written.push_back(made.path);
         }
-    if (!depfile)
-        return;
-    read.require_none(*depfile, "");
-    if (makers.contains(place_of(target_of(*depfile))))
-        throw failure(*depfile + ": cannot write dependencies: it is a database");
+    if (depfile) {
+        read.require_none(*depfile, "");
+        if (!makers.emplace(place_of(target_of(*depfile)), nullptr).second)
+            throw failure(*depfile + ": cannot write dependencies: it is a database");
+        written.push_back(*depfile);
+    }
+    for (const std::string &path : written) {
+        std::string temporary = temporary_of(target_of(path));
+        read.require_none(temporary, "");
+        if (makers.contains(place_of(temporary)))
+            throw failure(temporary + ": cannot write: it is the temporary file of " + path);
+    }
 }
 
 } // namespace cdef::build_command

@@ -382,12 +382,15 @@ def test_refuses(world, arguments, message):
     (("-d", "p", "a/Disk.cdefsrc", "here/hard"), b"p/Disk.cdef: cannot write: it is the source here/hard"),
     (("one/x.cdefsrc", "two/x.cdefsrc"),
      b"two/../here/out/x.cdef: it would be built from one/x.cdefsrc and from two/x.cdefsrc"),
+    ((".Disk.cdef.cdef-new", "Disk.cdefsrc"), b".Disk.cdef.cdef-new: cannot write: it is the source .Disk.cdef.cdef-new"),
+    (("-o", ".d.cdef-new", "--depfile", "d", SOURCE), b".d.cdef-new: cannot write: it is the temporary file of d"),
+    (("-o", "d", "--depfile", "here/.d.cdef-new", SOURCE), b".d.cdef-new: cannot write: it is the temporary file of d"),
     (("--list", "one/x.cdefsrc", "two/x.cdefsrc"),
      b"two/../here/out/x.cdef: it would be built from one/x.cdefsrc and from two/x.cdefsrc"),
 ])
 def test_writes_to_no_file_that_it_reads_and_to_none_twice(world, arguments, message):
     """Whatever the files' names are."""
-    sources(world, "a/Disk.cdefsrc", "p/Disk.cdef", "one/x.cdefsrc", "two/x.cdefsrc")
+    sources(world, "a/Disk.cdefsrc", "p/Disk.cdef", "one/x.cdefsrc", "two/x.cdefsrc", ".Disk.cdef.cdef-new", "Disk.cdefsrc")
     world.path("hard").hardlink_to(world.path("p/Disk.cdef"))
     world.path("here").symlink_to(".")
     for name, text in (("cdef.toml", ""), ("one/cdef.toml", "[build]\ndirectory = '../out'\n"),

@@ -111,7 +111,7 @@ void require_separate_files(const std::vector<build::unit> &units, const std::op
         std::string temporary = temporary_of(target_of(path));
         read.require_none(temporary, "");
         if (makers.contains(place_of(temporary)))
-            throw failure(temporary + ": cannot write: it is the temporary file of " + path);
+            throw failure(temporary.append(": cannot write: it is the temporary file of ").append(path));
     }
 }
 

@@ -101,6 +101,8 @@ baseline::baseline(std::string wanted) : kind(kinds::FILE), place(std::move(want
         throw failure(place + ": " + (error ? error.message() : "No such file or directory"));
     if (fs::is_directory(is))
         kind = kinds::DIRECTORY;
+    else if (!fs::is_regular_file(is)) /* a device may have no end, and a pipe no writer */
+        throw failure(place + ": not a regular file");
 }
 
 std::optional<older_version> baseline::version_of(const std::string &path) const {

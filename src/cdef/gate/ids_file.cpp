@@ -13,14 +13,16 @@
 namespace cdef::gate_command {
 
 ids_file::ids_file(std::string name, bool may_be_missing) : path(std::move(name)), is_there(true) {
+    namespace fs = std::filesystem;
     std::error_code error;
-    if (may_be_missing && !std::filesystem::exists(path, error) && !error) {
+    /* A link that leads nowhere is there, and is then reported as a file that cannot be read. */
+    if (may_be_missing && fs::symlink_status(path, error).type() == fs::file_type::not_found) {
         is_there = false;
         return;
     }
-    /* A device may have no end. */
-    std::filesystem::file_status is = std::filesystem::status(path, error);
-    if (std::filesystem::exists(is) && !std::filesystem::is_regular_file(is) && !std::filesystem::is_fifo(is))
+    /* A device may have no end, and a pipe no writer. */
+    fs::file_status is = fs::status(path, error);
+    if (fs::exists(is) && !fs::is_regular_file(is))
         throw failure(path + ": not a regular file");
     before = text_of_file(path);
     try {

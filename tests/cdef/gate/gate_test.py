@@ -548,15 +548,34 @@ def test_refuses_lines_that_end_with_a_carriage_return(world):
 @pytest.mark.parametrize("arguments, message", [
     (("--update", "--ids=/dev/full"), b"/dev/full: not a regular file"),
     (("--ids=/dev/zero",), b"/dev/zero: not a regular file"),
+    (("--against=/dev/zero",), b"/dev/zero: not a regular file"),
+    (("--against=pipe",), b"pipe: not a regular file"),
+    (("--ids=pipe",), b"pipe: not a regular file"),
+    (("--ids=link",), b"link: No such file or directory"),
+    (("--update", "--ids=link"), b"link: No such file or directory"),
     (("--against", ""), b"--against: expected a file, a directory, or git:REVISION"),
     (("--ids", ""), b"--ids: expected a file"),
     (("--config", ""), b"--config: expected a file"),
 ])
 def test_refuses_names_of_no_file(world, arguments, message):
-    """Even if the numbers could be checked."""
+    """Even if the numbers could be checked. Nobody writes to the pipe, and the link leads nowhere."""
     write(world, "a.cdefsrc", HEAD)
     write(world, "ids.lock", "")
+    os.mkfifo(world.path("pipe"))
+    world.path("link").symlink_to("nowhere")
     expect(world.inspect("gate", *arguments, "a.cdefsrc"), 2, b"cdef: " + message + b"\n")
+
+
+def test_refuses_a_default_file_of_numbers_that_is_no_file(world):
+    """A link that leads nowhere is not a missing file, and a pipe is not waited for."""
+    write(world, "old.cdefsrc", HEAD)
+    write(world, "a.cdefsrc", HEAD)
+    for make, why in ((lambda path: path.symlink_to("nowhere"), b"No such file or directory"),
+                      (os.mkfifo, b"not a regular file")):
+        make(world.path("ids.lock"))
+        for arguments in (("--against=old.cdefsrc",), ("--update",)):
+            expect(world.inspect("gate", *arguments, "a.cdefsrc"), 2, b"cdef: ids.lock: " + why + b"\n")
+        world.path("ids.lock").unlink()
 
 
 # ---- Project files ---------------------------------------------------------------------------------------------------

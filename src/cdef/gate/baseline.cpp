@@ -105,6 +105,14 @@ baseline::baseline(std::string wanted) : kind(kinds::FILE), place(std::move(want
         throw failure(place + ": not a regular file");
 }
 
+bool baseline::is_one_file(const std::string &path) const {
+    if (kind != kinds::REVISION_PATH)
+        return kind == kinds::FILE;
+    revision at(revision_name, fs::path(path).parent_path().string(), path);
+    std::optional<revision::entry> named = at.find(place);
+    return named && !named->is_directory;
+}
+
 std::optional<older_version> baseline::version_of(const std::string &path) const {
     if (kind == kinds::FILE)
         return version_in(place);

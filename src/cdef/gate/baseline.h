@@ -30,9 +30,11 @@ public:
      * none. */
     explicit baseline(std::string wanted);
 
-    /* Whether there is one older version for all. */
-    bool is_one_file() const {
-        return kind == kinds::FILE;
+    /* True if there is one older version for this class and all others that are compared with this. Throws failure. */
+    bool is_one_file(const std::string &path) const;
+    /* True if the older version of a class is found by the name of its file. */
+    bool goes_by_file_names() const {
+        return kind != kinds::FILE;
     }
     /* The older version of a source or a database; nothing if there is none. Throws failure. */
     std::optional<older_version> version_of(const std::string &path) const;

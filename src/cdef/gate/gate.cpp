@@ -90,14 +90,15 @@ public:
 private:
     struct operand {
         std::string path;
-        std::string directory; /* that was given, and in which it is; empty: it was given itself */
         const config::settings &settings;
         const baseline *against; /* null: it is not compared */
         ids_file *ids;
     };
 
-    std::vector<operand> operands();
-    void look_for_former(const std::vector<operand> &all);
+    void find_operands();
+    void add_operand(const std::string &path, const std::string &directory);
+    void refuse_one_file_for_many() const;
+    void look_for_former();
     const baseline *baseline_for(const config::settings &settings);
     ids_file *ids_for(const std::string &source, const config::settings &settings);
     void look_at(const operand &what, report::writer &form);
@@ -112,6 +113,10 @@ private:
     project_files projects;
     std::map<std::string, baseline> baselines; /* by what names them */
     std::map<std::string, ids_file> ids;       /* by path */
+    std::vector<operand> operands;
+    std::set<std::string> compared; /* absolute paths of the operands */
+    /* The sources in each directory that was given, and what they are compared with. */
+    std::map<std::pair<std::string, const baseline *>, std::vector<std::string>> directories;
     gate_command::former_files former;
     std::set<std::string> classes; /* names of those that are there */
     bool pass = true;
@@ -137,34 +142,48 @@ ids_file *gate_run::ids_for(const std::string &source, const config::settings &s
     return &ids.try_emplace(fs::weakly_canonical(path, error).string(), path, may_be_missing).first->second;
 }
 
-std::vector<gate_run::operand> gate_run::operands() {
-    std::vector<operand> all;
-    for (const std::string &given : options.operands) {
+/* directory: that was given, and in which the source is; empty: the source was given itself. */
+void gate_run::add_operand(const std::string &path, const std::string &directory) {
+    const config::settings &settings = projects.of(path);
+    const baseline *against = baseline_for(settings);
+    if (path == "-" && against != nullptr && against->goes_by_file_names())
+        throw failure("standard input has no file name by which to find its older version: compare it with a file");
+    if (!directory.empty() && against != nullptr)
+        directories[{directory, against}].push_back(path);
+    std::error_code error;
+    if (!compared.insert(path == "-" ? path : fs::absolute(path, error).lexically_normal().string()).second)
+        return;
+    operands.push_back({path, settings, against, ids_for(path, settings)});
+    if (against == nullptr && !operands.back().ids->exists() && !options.update)
+        throw failure(path + ": nothing to compare it with: name an older version with --against");
+}
+
+void gate_run::refuse_one_file_for_many() const {
+    std::map<const baseline *, std::size_t> counts;
+    for (const operand &each : operands)
+        ++counts[each.against];
+    for (const operand &each : operands)
+        if (std::size_t count = std::exchange(counts[each.against], 0); /* each baseline once */
+            count > 1 && each.against != nullptr && each.against->is_one_file(each.path))
+            throw failure("--against names one file, and there are " + std::to_string(count) + " classes");
+}
+
+void gate_run::find_operands() {
+    for (const std::string &each : options.operands) {
         std::error_code error;
-        std::string directory = given != "-" && fs::is_directory(given, error) ? given : "";
-        for (const std::string &path : sources_of({given})) {
-            const config::settings &settings = projects.of(path);
-            all.push_back({path, directory, settings, baseline_for(settings), ids_for(path, settings)});
-            const operand &last = all.back();
-            if (last.against == nullptr && !last.ids->exists() && !options.update)
-                throw failure(path + ": nothing to compare it with: name an older version with --against");
-        }
+        std::string directory = each != "-" && fs::is_directory(each, error) ? each : "";
+        for (const std::string &path : sources_of({each}))
+            add_operand(path, directory);
     }
-    if (all.size() > 1 && all.front().against != nullptr && all.front().against->is_one_file())
-        throw failure("--against names one file, and there are " + std::to_string(all.size()) + " classes");
-    return all;
+    refuse_one_file_for_many();
 }
 
 /* Only a directory says that what is not in it is gone. */
-void gate_run::look_for_former(const std::vector<operand> &all) {
-    std::map<std::pair<std::string, const baseline *>, std::vector<std::string>> sources;
+void gate_run::look_for_former() {
     std::vector<std::string> paths;
-    for (const operand &each : all) {
+    for (const operand &each : operands)
         paths.push_back(each.path);
-        if (!each.directory.empty() && each.against != nullptr)
-            sources[{each.directory, each.against}].push_back(each.path);
-    }
-    for (const auto &[where, there] : sources)
+    for (const auto &[where, there] : directories)
         former.look_for(*where.second, where.first, there, paths);
 }
 
@@ -186,9 +205,9 @@ std::vector<check::finding> gate_run::breaches(const operand &what, const std::s
     if (before != nullptr)
         found = gate::judge({before->origin(), now.origin(), source}, level_called(level));
     std::vector<check::finding> more;
-    if (options.update)
+    if (options.update && found.empty())
         more = what.ids->accept(numbers_of(what, named_after, now, source), gate::source_places(source));
-    else if (what.ids->exists())
+    else if (!options.update && what.ids->exists())
         more = what.ids->record().judge(numbers_of(what, named_after, now, source), gate::source_places(source));
     found.insert(found.end(), std::make_move_iterator(more.begin()), std::make_move_iterator(more.end()));
     std::stable_sort(found.begin(), found.end(),
@@ -266,10 +285,10 @@ void gate_run::report_former(report::writer &form) {
 }
 
 int gate_run::run() {
-    std::vector<operand> all = operands();
-    look_for_former(all);
+    find_operands();
+    look_for_former();
     std::unique_ptr<report::writer> form = options.findings.writer(rules());
-    for (const operand &each : all)
+    for (const operand &each : operands)
         look_at(each, *form);
     report_former(*form);
     form->close();

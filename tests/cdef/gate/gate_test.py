@@ -400,8 +400,45 @@ def test_refuses_older_versions_that_are_not_there(world):
     git(world, "commit", "-qm", "nothing", "--allow-empty")
     expect(world.inspect("gate", "--against=git:HEAD:none", "a.cdefsrc"), 2,
            b"cdef: git:HEAD:none: no such file or directory at that revision\n")
-    expect(world.inspect("gate", "--against=a.cdefsrc", "a.cdefsrc", "a.cdefsrc"), 2,
-           b"cdef: --against names one file, and there are 2 classes\n")
+
+
+def test_compares_one_file_with_one_class(world):
+    """A file at a revision is refused for several classes as a plain file is."""
+    committed(world, "r", {"a.cdefsrc": A, "p/a.cdefsrc": A, "p/b.cdefsrc": B})
+    several = (2, b"cdef: --against names one file, and there are 2 classes\n")
+    for against in ("p/a.cdefsrc", "git:HEAD:p/a.cdefsrc", "git:HEAD:./a.cdefsrc"):
+        expect(world.inspect("gate", "--against", against, "p", cwd=world.path("r")), *several)
+        expect(world.inspect("gate", "--against", against, "p/b.cdefsrc", "p/a.cdefsrc", cwd=world.path("r")), *several)
+        expect(world.inspect("gate", "--against", against, "p/a.cdefsrc", cwd=world.path("r")), 0)
+
+
+def test_compares_each_source_once(world):
+    """However often and however it is given. The directory still says what is gone."""
+    old, new = with_class(ATTRIBUTE.format("Size", 1, "Int32")), with_class(ATTRIBUTE.format("Size", 2, "Int32"))
+    write(world, "old/a.cdefsrc", old)
+    write(world, "old/b.cdefsrc", B)
+    write(world, "new/a.cdefsrc", new)
+    for operands in (("new", "new/a.cdefsrc"), ("./new/../new/a.cdefsrc", "new/"),
+                     (str(world.path("new").absolute()), "new/a.cdefsrc", "new")):
+        status, findings = found(world, "--against=old", *operands)
+        check((status, [each["message"] for each in findings]) == (1, [
+            "~ PersistentResourceAttribute 'Size': Id 1 -> 2 (readers know it by its number)",
+            "- ResourceClass 'B' (readers miss it)"]), operands, findings)
+    expect(world.inspect("gate", "--against=old/a.cdefsrc", "old/a.cdefsrc", "old/./a.cdefsrc"), 0)
+
+
+def test_compares_standard_input_with_a_file_only(world):
+    """It has no name that could be looked for in a directory or at a revision."""
+    old, new = with_class(ATTRIBUTE.format("Size", 1, "Int32")), with_class(ATTRIBUTE.format("Size", 2, "Int32"))
+    committed(world, "r", {"a.cdefsrc": old})
+    write(world, "new", new)
+    for against in ("git:HEAD", "git:HEAD:a.cdefsrc", "."):
+        with open(world.path("new"), "rb") as stdin:
+            expect(world.inspect("gate", "--against", against, "-", stdin=stdin, cwd=world.path("r")), 2,
+                   b"cdef: standard input has no file name by which to find its older version: compare it with a file\n")
+    with open(world.path("new"), "rb") as stdin:
+        status, findings = found(world, "--against=r/a.cdefsrc", "-", stdin=stdin)
+    check((status, codes(findings)) == (1, {"CMP102"}), findings)
 
 
 def test_refuses_what_cannot_be_compared(world):
@@ -535,6 +572,25 @@ def test_records_no_two_meanings_at_once(world):
     check((status, [each["code"] for each in findings]) == (1, ["CMP401"]), findings)
     check(world.read("ids.lock").decode().split("\n")[1:] ==
           ["Disk\tPersistentResourceAttribute\t1\tInt32\tSize", ""], "recorded")
+
+
+def test_records_no_numbers_of_a_class_that_breaks_an_older_version(world):
+    """The numbers of the other classes are recorded. Without the older version, all are, and if
+    the classes are compared with themselves."""
+    one = ATTRIBUTE.format("Size", 1, "Int32")
+    write(world, "old/a.cdefsrc", with_class(one))
+    write(world, "new/a.cdefsrc", with_class(one.replace("Id=1", "Id=2")))
+    write(world, "new/b.cdefsrc", with_class(one).replace("Name=Disk", "Name=Tape"))
+    arguments = ("--update", "--ids=ids.lock", "new/a.cdefsrc", "new/b.cdefsrc")
+    status, findings = found(world, "--against=old", *arguments)
+    check((status, [each["code"] for each in findings]) == (1, ["CMP102"]), findings)
+    size = "PersistentResourceAttribute\t{}\tInt32\tSize"
+    check(world.read("ids.lock").decode().split("\n")[1:] == ["Tape\t" + size.format(1), ""], "with")
+    for intended in ((), ("--against=new",)):
+        expect(world.inspect("gate", *arguments, *intended), 0)
+        check(world.read("ids.lock").decode().split("\n")[1:] ==
+              ["Disk\t" + size.format(2), "Tape\t" + size.format(1), ""], intended)
+        world.path("ids.lock").unlink()
 
 
 def test_refuses_lines_that_end_with_a_carriage_return(world):

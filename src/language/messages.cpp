@@ -86,7 +86,7 @@ constexpr message table[] = {
     {MSG_RANGE_NEEDS_TWO, "S206", "Range requires two values", FIRST, mark_kind::value, blame::source,
      "A `Range` has no comma.", "Write `low,high`."},
     {MSG_INVALID_VALUE, "S207", "str_to_vx: Invalid data", FIRST, mark_kind::value, blame::source,
-     "The value is not of the attribute's data type, or its element has an unknown data type, which the "
+     "The value does not fit the attribute's data type, or it belongs to an element of unknown data type, which the "
      "note shows. Or an earlier number overflowed: after that, a 0 or the limit of a type is refused, and "
      "the note says where.",
      "Write the value as its type requires; shorten the number that overflows."},

@@ -91,8 +91,8 @@ constexpr row rows[] = {
       "A `Range` of a `DynamicClassAttribute` is stored in a `DynamicResourceAttribute` that is still "
       "open. Or another dynamic attribute is completed between the `Range` and the end of its own attribute. Then the "
       "`Range` may be lost, and the other attribute, if it has no `Range`, gets the range 0 to 0 instead of 0 to 100.",
-      "Put dynamic class attributes first, and one without a `Range` last among them. After an attribute "
-      "with a `Range`, put another of its kind."},
+      "Put dynamic class attributes before dynamic resource attributes, and let the last of them have no `Range`. "
+      "After an attribute with a `Range`, put another of its kind."},
      make_range_elsewhere},
     {{UNUSED_DEFAULT, "S511", "unused-default", "a DefaultValue is never used",
       "A `PersistentClassAttribute` has a `DefaultValue`, which is never used.", "Remove the line."},
@@ -244,8 +244,7 @@ constexpr row rows[] = {
       "Make them alike, or give one of them another name."},
      make_nothing},
     {{RULE_NAME, "S615", "rule-name", "a build system misreads the name of a file",
-      "The file of `--depfile` has a name that Make and Ninja do not both read as it is. Ninja then builds the "
-      "database "
+      "The file of `--depfile` contains a name that Make or Ninja misreads. Ninja then builds the database "
       "every time, and Make does not notice a change of the source. Only `cdef build` reports this.",
       "Rename the file or its directory. If only the other program reads the file, turn the warning off."},
      make_nothing},

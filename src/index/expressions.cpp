@@ -19,15 +19,11 @@ bool is_digit(char c) {
     return c >= '0' && c <= '9';
 }
 
-/* The end of the quoted text that begins here, after its closing quote; npos if it has none. */
+/* The end of the quoted text that begins here, after its closing quote; npos if it has none. A quote after a backslash
+ * counts, as in all of a source. */
 std::size_t end_of_quoted(std::string_view text, std::size_t open) {
-    for (std::size_t at = open + 1; at < text.size(); ++at) {
-        if (text[at] == '\\')
-            ++at;
-        else if (text[at] == text[open])
-            return at + 1;
-    }
-    return std::string_view::npos;
+    std::size_t close = text.find(text[open], open + 1);
+    return close == std::string_view::npos ? close : close + 1;
 }
 
 std::size_t end_of_word(std::string_view text, std::size_t begin) {
@@ -52,7 +48,7 @@ std::vector<expression_name> names_in(std::string_view expression) {
             member_at = has_member ? end + 1 : std::string_view::npos;
             at = end;
         } else {
-            at += c == '\\' ? 2 : 1;
+            ++at;
         }
     }
     return found;
@@ -62,7 +58,7 @@ bool is_in_quotes(std::string_view expression, std::size_t offset) {
     for (std::size_t at = 0; at < std::min(offset, expression.size());) {
         char c = expression[at];
         if (c != '"' && c != '\'') {
-            at += c == '\\' ? 2 : 1;
+            ++at;
             continue;
         }
         std::size_t end = end_of_quoted(expression, at);

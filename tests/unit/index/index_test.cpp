@@ -67,7 +67,8 @@ TEST(Expressions, HaveNames) {
     using words = std::vector<std::string>;
     EXPECT_EQ(words_of("A > 0x1F && _b1<=1e5"), (words{"A", "_b1"}));
     EXPECT_EQ(words_of("A.B == \"C\" || D.E.F"), (words{"A", ".B", "D", ".E", ".F"}));
-    EXPECT_EQ(words_of(R"('it\'s A' \B)"), words{});
+    EXPECT_EQ(words_of(R"('it\'s A)"), (words{"s", "A"}));
+    EXPECT_EQ(words_of(R"(\"A\" B \C)"), (words{"B", "C"}));
     EXPECT_EQ(words_of("1.x"), words{"x"});
     EXPECT_EQ(words_of("\xCE\xB1 + 'x"), words{"\xCE\xB1"});
 }
@@ -123,11 +124,11 @@ TEST(Names, OfTwoClassesAreTwo) {
 }
 
 TEST(Quotes, ContainTheOffsetsBetweenThem) {
-    std::string_view text = R"(A == 'b\'c' && "d" 'e)";
+    std::string_view text = R"(A == 'b\' && "d\" 'e)";
     std::string inside;
     for (std::size_t at = 0; at <= text.size(); ++at)
         inside += source_index::is_in_quotes(text, at) ? '^' : ' ';
-    EXPECT_EQ(inside, "      ^^^^^     ^^  ^^");
+    EXPECT_EQ(inside, "      ^^^     ^^^  ^^");
 }
 
 TEST(Numbers, ContinueAfterTheHighest) {

@@ -68,4 +68,16 @@ attribute_parts parts_of(std::string_view source, const span &text) {
     return parts;
 }
 
+bool has_value(std::string_view line, std::string_view value) {
+    std::vector<source_index::line> read = lines_of(line);
+    return read.size() == 1 && read[0].kind == line_kind::attribute &&
+           parts_of(line, read[0].text).value.of(line) == value;
+}
+
+std::string written_value(std::string_view value) {
+    std::string plain(value);
+    std::string quoted = "\"" + plain + "\"";
+    return !has_value("\ta=" + plain, value) && has_value("\ta=" + quoted, value) ? quoted : plain;
+}
+
 } // namespace source_index

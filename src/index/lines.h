@@ -4,6 +4,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <string>
 #include <string_view>
 #include <vector>
 
@@ -49,6 +50,13 @@ struct attribute_parts {
 
 /* text: of an attribute line in the source */
 attribute_parts parts_of(std::string_view source, const span &text);
+
+/* Whether a line, without its newline, is an attribute line with this value. */
+bool has_value(std::string_view line, std::string_view value);
+
+/* A value as it is written after an equals sign: with quotes if it needs them. A value that no line can have is
+ * returned unchanged. */
+std::string written_value(std::string_view value);
 
 } // namespace source_index
 

@@ -203,8 +203,7 @@ void collector::add_quotes() {
     std::string quotes = "\"" + std::string(value) + "\"";
     std::string after = in.text().substr(line.whole.begin, place.attribute->parts.value.begin - line.whole.begin) +
                         quotes + in.text().substr(line.text.end, line.whole.end - line.text.end);
-    std::vector<source_index::line> read = source_index::lines_of(after);
-    if (read.size() == 1 && source_index::parts_of(after, read[0].text).value.of(after) == value)
+    if (source_index::has_value(after, value))
         add("Put the value in quotes", REWRITE, json::array({edit(place.attribute->parts.value, quotes)}));
 }
 

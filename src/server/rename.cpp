@@ -36,19 +36,11 @@ bool is_whole_value(document &in, const mention &each) {
     return line != nullptr && line->parts.value == each.at;
 }
 
-/* Whether this text after an equals sign means the name. */
-bool reads_as(std::string_view written, std::string_view name) {
-    std::string line = "\ta=" + std::string(written);
-    std::vector<source_index::line> read = source_index::lines_of(line);
-    return read.size() == 1 && source_index::parts_of(line, read[0].text).value.of(line) == name;
-}
-
 /* The text that replaces a mention: the new name, with quotes if it needs them. */
 replacement written_at(document &in, const mention &each, std::string_view name) {
     const source_index::attribute *line = in.index().attribute_at(in.index().line_at(each.at.begin));
-    if (!is_whole_value(in, each) || line->parts.quoted || reads_as(name, name))
-        return {each.at, std::string(name)};
-    return {each.at, "\"" + std::string(name) + "\""};
+    bool keeps_quotes = !is_whole_value(in, each) || line->parts.quoted;
+    return {each.at, keeps_quotes ? std::string(name) : source_index::written_value(name)};
 }
 
 std::string replaced(const std::string &text, const std::vector<replacement> &all) {
@@ -90,7 +82,7 @@ const check::finding *new_finding(const std::vector<check::finding> &before, con
 void require_writable(const place_in_source &place, const named &old, const std::string &name) {
     if (name.empty() || name.find_first_of(std::string_view("\n\r\0", 3)) != std::string::npos)
         throw request_error(REQUEST_FAILED, "this is no name");
-    if (!reads_as("\"" + name + "\"", name))
+    if (!source_index::has_value("\ta=\"" + name + "\"", name))
         throw request_error(REQUEST_FAILED, "a source cannot have " + language::quoted(name) + " as a name");
     if (old.in_expressions && !source_index::is_expression_name(name))
         throw request_error(REQUEST_FAILED, "an expression uses the name, and cannot have " + language::quoted(name));

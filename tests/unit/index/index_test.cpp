@@ -56,6 +56,15 @@ TEST(Values, AreWithoutQuotes) {
     EXPECT_EQ(value_in("a"), "");
 }
 
+TEST(Values, AreWrittenWithQuotesOnlyIfTheyNeedThem) {
+    for (const char *plain : {"b", "b c", " b", "a\"b", "a#", "b\\"})
+        EXPECT_TRUE(source_index::has_value("\ta=" + source_index::written_value(plain), plain)) << plain;
+    EXPECT_EQ(source_index::written_value("b c"), "b c");
+    EXPECT_EQ(source_index::written_value("b # c"), "\"b # c\"");
+    EXPECT_EQ(source_index::written_value("\"b"), "\"\"b\"");
+    EXPECT_EQ(source_index::written_value("#\\"), "#\\"); /* no line has this value */
+}
+
 std::vector<std::string> words_of(std::string_view expression) {
     std::vector<std::string> found;
     for (const source_index::expression_name &each : source_index::names_in(expression))

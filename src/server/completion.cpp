@@ -30,8 +30,10 @@ constexpr int VARIABLE = 6;
 /* Collects items that replace one part of the source. */
 class items {
 public:
-    items(const session &of, const place_in_source &at, const stretch &replaced)
-        : now(of), part(to_json(at.in.positions(of.client.units).of(replaced))) {}
+    items(const session &of, const place_in_source &at, const stretch &part)
+        : replaced(part), now(of), place(to_json(at.in.positions(of.client.units).of(part))) {}
+
+    const stretch replaced;
 
     /* text: what is inserted. Items are shown in the order in which they are added. */
     json &add(std::string_view label, int kind, std::string_view text, const std::string &documentation) {
@@ -41,7 +43,7 @@ public:
                      {"kind", kind},
                      {"sortText", std::string(DIGITS - std::min(DIGITS, order.size()), '0') + order},
                      {"filterText", label},
-                     {"textEdit", {{"range", part}, {"newText", text}}}};
+                     {"textEdit", {{"range", place}, {"newText", text}}}};
         if (!documentation.empty())
             item["documentation"] = {{"kind", "markdown"}, {"value", documentation}};
         all.push_back(std::move(item));
@@ -65,7 +67,7 @@ public:
 
 private:
     const session &now;
-    json part;
+    json place;
     json all = json::array();
 };
 
@@ -137,10 +139,11 @@ const stanza *stanza_after(const place_in_source &place) {
     return after == all.end() ? nullptr : &*after;
 }
 
-/* Whether attribute lines follow the line directly, so that a header on it would take them. */
+/* Whether the line or one below it is an attribute line of the stanza, which a header here would take. */
 bool has_lines_below(const place_in_source &place) {
     const stanza *of = place.stanza;
-    return of != nullptr && !of->attributes.empty() && of->attributes.back().line > place.line;
+    return of != nullptr && !of->attributes.empty() &&
+           place.in.index().lines[of->attributes.back().line].whole.end >= place.offset;
 }
 
 bool is_header(const place_in_source &place) {
@@ -285,14 +288,47 @@ void add_values(items &to, const language::name_list &names, const table_attrs &
         to.add(name, kind, name, value_documentation(attr, name));
 }
 
-void add_names(items &to, const place_in_source &place, name_kind kind, std::size_t scope) {
+/* The line of a place without the carriage return at its end. */
+stretch line_at(const place_in_source &place) {
+    if (place.in.index().lines.empty())
+        return {};
+    stretch line = place.in.index().lines[place.line].whole;
+    if (line.of(place.text()).ends_with('\r'))
+        --line.end;
+    return line;
+}
+
+/* Adds an item that gives the attribute this value, with quotes if it needs them. None if the line cannot have it. */
+void add_value(items &to, const place_in_source &place, std::string_view value, int kind, const std::string &about) {
+    const stretch &part = to.replaced;
+    const stretch line = line_at(place);
+    std::string_view source = place.text();
+    for (const std::string &text : {std::string(value), "\"" + std::string(value) + "\""}) {
+        std::string made(stretch{line.begin, part.begin}.of(source));
+        made.append(text).append(stretch{part.end, line.end}.of(source));
+        if (source_index::has_value(made, value)) {
+            to.add(value, kind, text, about);
+            return;
+        }
+    }
+}
+
+/* The numbers of the names of a kind that something defines, in order. */
+std::vector<std::size_t> defined_names(const place_in_source &place, name_kind kind, std::size_t scope) {
     const source_index::names &names = place.in.names();
     std::set<std::size_t> taken;
+    std::vector<std::size_t> found;
     for (const source_index::mention &each : names.mentions) {
         const source_index::named &name = names.all[each.name];
         if (each.defines && name.kind == kind && name.scope == scope && taken.insert(each.name).second)
-            to.add(name.text, VARIABLE, name.text, name_documentation(place.in, each.name));
+            found.push_back(each.name);
     }
+    return found;
+}
+
+void add_names(items &to, const place_in_source &place, name_kind kind, std::size_t scope) {
+    for (std::size_t name : defined_names(place, kind, scope))
+        add_value(to, place, place.in.names().all[name].text, VARIABLE, name_documentation(place.in, name));
 }
 
 /* Properties that the list does not have yet. */
@@ -309,6 +345,13 @@ void add_properties(items &to, const place_in_source &place, const stretch &item
             to.add(name, ENUM_MEMBER, name, value_documentation(attr, name));
 }
 
+/* A name that is not one word cannot be used in an expression. */
+void add_word(items &to, const place_in_source &place, std::size_t name) {
+    const std::string &text = place.in.names().all[name].text;
+    if (source_index::is_expression_name(text))
+        to.add(text, VARIABLE, text, name_documentation(place.in, name));
+}
+
 /* Attributes of the class or, after a dot, the elements of the attribute before it. */
 void add_expression_names(items &to, const place_in_source &place, const stretch &word) {
     const source_index::names &names = place.in.names();
@@ -320,7 +363,8 @@ void add_expression_names(items &to, const place_in_source &place, const stretch
     if (!member) {
         for (name_kind kind : {name_kind::dynamic_resource, name_kind::persistent_resource, name_kind::dynamic_class,
                                name_kind::persistent_class})
-            add_names(to, place, kind, scope);
+            for (std::size_t name : defined_names(place, kind, scope))
+                add_word(to, place, name);
         return;
     }
     const source_index::mention *before = names.at(word.begin - 1);
@@ -331,8 +375,7 @@ void add_expression_names(items &to, const place_in_source &place, const stretch
             continue;
         std::string_view owner = place.in.index().stanzas[of.owner].value(place.text(), "Name");
         if (owner == names.all[before->name].text)
-            to.add(names.all[each.name].text, VARIABLE, names.all[each.name].text,
-                   name_documentation(place.in, each.name));
+            add_word(to, place, each.name);
     }
 }
 
@@ -343,7 +386,7 @@ void add_valid_values(items &to, const place_in_source &place) {
         bool valid = each.known != nullptr && each.known->ta_type == AT_VALID_VALUE;
         std::string_view value = valid ? each.parts.value.of(place.text()) : std::string_view();
         if (!value.empty() && value.find(',') == value.npos && shown.insert(value).second)
-            to.add(value, VALUE, value, attribute_documentation(place.stanza->row(), *each.known));
+            add_value(to, place, value, VALUE, attribute_documentation(place.stanza->row(), *each.known));
     }
 }
 
@@ -414,8 +457,25 @@ stretch value_part(const place_in_source &place) {
     return part;
 }
 
+/* Whether the client sees two lines, because a carriage return divides them. */
+bool is_in_two_lines(const place_in_source &place, const stretch &part) {
+    return part.of(place.text()).find('\r') != std::string_view::npos;
+}
+
+/* Whether the place is after the value: after its closing quote, or between it and a comment. */
+bool is_after_value(const place_in_source &place) {
+    const source_index::attribute_parts &parts = place.attribute->parts;
+    if (parts.quoted && parts.closed)
+        return place.offset > parts.value.end;
+    std::string_view rest = stretch{parts.written.end, line_at(place).end}.of(place.text());
+    return place.offset > parts.written.end && rest.find_first_not_of(" \t") != rest.npos;
+}
+
 json value_items(const session &now, const place_in_source &place) {
     stretch part = value_part(place);
+    part.end = std::max(place.offset, std::min(part.end, line_at(place).end));
+    if (is_after_value(place) || is_in_two_lines(place, part))
+        return json::array();
     items found(now, place, part);
     add_by_type(found, place, part);
     return found.take();
@@ -428,7 +488,8 @@ std::size_t end_of_word(const place_in_source &place) {
         word = place.attribute->parts.name;
     if (!word.touches(place.offset))
         return place.offset;
-    std::string_view rest = stretch{place.offset, word.end}.of(place.text());
+    std::size_t end = std::max(place.offset, std::min(word.end, line_at(place).end));
+    std::string_view rest = stretch{place.offset, end}.of(place.text());
     return place.offset + std::min(rest.find_first_of(" \t"), rest.size());
 }
 
@@ -448,10 +509,14 @@ json completion(session &now, const json &params) {
                     place.offset >= place.attribute->parts.value.begin && begin != place.offset;
     if (in_value)
         return value_items(now, place);
-    items found(now, place, {word, end_of_word(place)});
+    stretch part = {word, end_of_word(place)};
+    bool before_name = place.attribute != nullptr && place.offset < place.attribute->parts.name.begin;
+    if (is_in_two_lines(place, part))
+        return json::array();
+    items found(now, place, part);
     if (word == begin)
         add_stanzas(found, place);
-    else if (place.stanza != nullptr && place.stanza->is_known() && before.find('=') == before.npos)
+    else if (place.stanza != nullptr && place.stanza->is_known() && !before_name && before.find('=') == before.npos)
         add_attributes(found, place);
     return found.take();
 }

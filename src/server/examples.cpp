@@ -4,8 +4,8 @@
 
 #include "language/names.h"
 
-#include <algorithm>
 #include <set>
+#include <unordered_set>
 
 namespace lsp {
 
@@ -13,14 +13,13 @@ namespace {
 
 /* "NewName"; with a number if another stanza has this name. */
 std::string new_name(std::string_view source, const source_index::index &of, const char *attribute) {
-    auto is_used = [&](std::string_view name) {
-        return std::any_of(of.stanzas.begin(), of.stanzas.end(), [&](const source_index::stanza &each) {
-            return each.is_known() && each.value(source, attribute) == name;
-        });
-    };
+    std::unordered_set<std::string_view> used;
+    for (const source_index::stanza &each : of.stanzas)
+        if (each.is_known())
+            used.insert(each.value(source, attribute));
     std::string first = "New" + std::string(attribute);
     std::string name = first;
-    for (int number = 2; is_used(name); ++number)
+    for (int number = 2; used.contains(name); ++number)
         name = first + std::to_string(number);
     return name;
 }
@@ -46,7 +45,7 @@ std::string example_number(std::string_view source, const source_index::stanza &
         lower = in.value(source, "ObservationInterval");
     else if (attribute == "LastKey")
         lower = in.value(source, "FirstKey");
-    return lower.empty() ? "0" : std::string(lower);
+    return lower.empty() ? "0" : source_index::written_value(lower);
 }
 
 } // namespace
@@ -73,7 +72,7 @@ std::string example_value(std::string_view source, const source_index::index &of
     case AT_MANAGER: {
         bool defines_class = in.kind == SC_RESOURCE_VARIABLE_CLASS && std::string_view(attr.ta_name) == "VariableClass";
         std::string wanted = defines_class ? undefined_variable_class(source, of) : std::string();
-        return wanted.empty() ? new_name(source, of, attr.ta_name) : wanted;
+        return wanted.empty() ? new_name(source, of, attr.ta_name) : source_index::written_value(wanted);
     }
     default:
         return example_number(source, in, attr.ta_name);

@@ -17,9 +17,10 @@ place_in_source place_at(document &in, std::size_t offset) {
         const source_index::line &on = index.lines[line];
         std::string_view rest = std::string_view(in.text()).substr(on.text.end, on.whole.end - on.text.end);
         std::size_t blanks = rest.find_first_not_of(" \t\r\"");
-        bool has_comment = on.kind == source_index::line_kind::comment || (!on.text.is_empty() && blanks != rest.npos);
-        std::size_t begin = on.text.is_empty() ? on.whole.begin : on.text.end + std::min(blanks, rest.size());
-        in_comment = has_comment && offset > begin && offset <= on.whole.end;
+        bool has_comment = !on.text.is_empty() && blanks != rest.npos;
+        bool after_begin =
+            on.kind == source_index::line_kind::comment || (has_comment && offset > on.text.end + blanks);
+        in_comment = after_begin && offset <= on.whole.end;
     }
     return {in,
             offset,

@@ -12,7 +12,7 @@ struct place_in_source {
     std::size_t line;                         /* in index::lines; 0 in an empty source */
     const source_index::stanza *stanza;       /* null: before the first header */
     const source_index::attribute *attribute; /* null: the line has none */
-    bool in_comment;                          /* after the line's text, where a comment begins */
+    bool in_comment;                          /* on a line without a text, or after the text */
 
     /* Whether stanzas of this kind have the attribute. */
     bool has_known_attribute() const {

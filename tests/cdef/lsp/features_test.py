@@ -418,6 +418,70 @@ def test_no_stanza_is_offered_between_attributes(pump):
     assert items == []
 
 
+@pytest.mark.parametrize("words", ["|\tLocator", "|\tReArmExpression", "|# A pump", "|\tDescriptiveMessageSet"])
+def test_no_stanza_is_offered_on_a_line_with_a_text(pump, words):
+    """The text would become the last line's."""
+    assert at(pump, "textDocument/completion", place(PUMP, words)) == []
+
+
+@pytest.mark.parametrize("line", ["  |  Locator=Host", "\t|# x", "|  # x", "\tLocator=Ho\rs|t", "\tLo\rc|ator=Host",
+                                  "\tLocator=Host |# x", "\tLocator=Host  | // x", '\tLocator="Host"|', '\tLocator=|"Host"',
+                                  '\tLocator="Host" |', "\tLocator= | /* x"])
+def test_nothing_is_offered_outside_of_a_word(pump, line):
+    """An item would run into what follows, or take away what comes before. A carriage return divides a line for the
+    client, but not for the compiler."""
+    assert complete(pump, PUMP.replace("\tLocator=Host", line))[0] == []
+
+
+@pytest.mark.parametrize("line, label, after", [
+    ("\tLocator=H| # x", "Host", "\tLocator=Host # x"), ("\tLocator= |", "Host", "\tLocator=Host"),
+    ("\tLocator=Ho|st\r", "Host", "\tLocator=Host\r"), ("\tLoc|ator=Host\r", "Locator", "\tLocator=Host\r"),
+    ('\tLocator="H|', "Host", '\tLocator="Host'), ('\tLocator="|" # x', "Host", '\tLocator="Host" # x'),
+])
+def test_an_item_leaves_the_rest_of_its_line(pump, line, label, after):
+    _, taken = complete(pump, PUMP.replace("\tLocator=Host", line))
+    assert taken(label) == PUMP.replace("\tLocator=Host", after)
+
+
+@pytest.mark.parametrize("line", ["\tExpression=\"Speed > 9\"|", "\tExpression=|\"Speed > 9\"",
+                                  "\tExpression=\"Speed > 9\"  |", "\tExpression=Speed > 9 |# x",
+                                  '\tExpression="Host == \\"Sp|eed\\""'])
+def test_names_are_offered_only_within_an_expression(pump, line):
+    """And outside of its quotes: one after a backslash is a quote like any other."""
+    assert complete(pump, PUMP.replace('\tExpression="Speed.Turns > 9 && Speed.Turns < 99"', line))[0] == []
+
+
+def test_names_that_are_not_one_word_are_not_offered_in_expressions(pump):
+    text = PUMP.replace("Name=Speed", 'Name="Speed # 1"').replace("Host == ", "| == ")
+    assert labels(complete(pump, text)[0]) == ["Host"]
+
+
+ODD = ["Printer # Status", "Host // Name", "/* A", "A #", '"A4', '"A4"']
+
+
+@pytest.mark.parametrize("name", ODD)
+@pytest.mark.parametrize("line", ["\tLocator=|", "\tLocator=| # x", '\tLocator="|"', "\tVariableClass=|", "\tDefaultValue=|"])
+def test_items_have_quotes_where_the_value_needs_them(pump, line, name):
+    """The result means the name and has no finding, as if the author had written it."""
+    text = (PUMP.replace("Locator=Host", f'Locator="{name}"').replace("Name=Host", f'Name="{name}"')
+            .replace("Class=Flow", f'Class="{name}"').replace("Host == 'Host'", "Speed")
+            .replace("\tProperties=Public,ReqdForDefine\n",
+                     f'\tProperties=Public,ReqdForDefine\n\tValidValue="{name}"\n\tDefaultValue="{name}"\n'))
+    attribute = line[:line.index("=") + 1]
+    begin = text.rindex(attribute)
+    before, after = text[:begin], text[text.index("\n", begin):]
+    show(pump, text)
+    findings = [each["code"] for each in pump.diagnostics(URI, pump.version)]
+    items, taken = complete(pump, before + line + after)
+    if name == '"A4' and line.endswith("# x"):
+        assert name not in labels(items)  # with a lone quote before it, the comment would be part of the value
+        return
+    comment = " # x" if line.endswith("# x") else ""
+    same(taken(name), before + attribute + f'"{name}"' + comment + after, "the text")
+    show(pump, taken(name))
+    assert [each["code"] for each in pump.diagnostics(URI, pump.version)] == findings
+
+
 def test_types_are_those_of_the_stanza(pump):
     items, taken = complete(pump, CLASS + "PersistentResourceAttribute\n\tDataType=In|")
     assert "SDArray" in labels(items) and "SBS" not in labels(items)
@@ -756,6 +820,13 @@ def test_added_values_fit_the_others(pump):
     (action,) = pump.about("textDocument/codeAction", URI, range={"start": where, "end": where},
                            context={"diagnostics": [], "only": ["quickfix"]})
     assert "\tName=NewName2\n" in action["edit"]["documentChanges"][0]["edits"][0]["newText"]
+
+
+def test_added_variable_class_has_quotes_if_it_needs_them(pump):
+    text = PUMP.replace("\tVariableClass=Flow\n\tObs", "\tObs").replace("=Flow", '="Flow # 1"')
+    show(pump, text)
+    made, _ = actions(pump, "Resource|Variable", text, only=["quickfix"])
+    assert made["Add `VariableClass`"] == text.replace("Interval=60\n", 'Interval=60\n\tVariableClass="Flow # 1"\n')
 
 
 def test_quotes(pump):

@@ -1,6 +1,7 @@
 """Test the hooks with Debian's pre-commit and the installed programs."""
 
 import os
+import shutil
 import subprocess
 import unittest
 
@@ -67,6 +68,28 @@ class Hooks(Case):
         status, said = self.run_hooks()
         self.assertEqual(status, 1, said)
         self.assertIn("Id 1 -> 77 (readers know it by its number) [CMP102]", said)
+
+    def test_stop_what_breaks_others_in_a_renamed_source(self):
+        self.git(self.project, "mv", "--", self.source.name, "-new.cdefsrc")
+        self.source = self.project / "-new.cdefsrc"
+        status, said = self.run_hooks()
+        self.assertEqual(status, 0, said)
+        self.change(b"Id=1\n", b"Id=77\n")
+        status, said = self.run_hooks()
+        self.assertEqual(status, 1, said)
+        self.assertIn("Id 1 -> 77 (readers know it by its number) [CMP102]", said)
+
+    def test_pass_the_first_commit(self):
+        """Its classes are new. Warnings still stop it."""
+        shutil.rmtree(self.project / ".git")
+        self.git(self.project, "init", "-q", ".")
+        status, said = self.run_hooks()
+        self.assertEqual(status, 0, said)
+        self.assertEqual(said.count("Passed"), 2, said)
+        self.change(b"Public,", b"Public,Public,")
+        status, said = self.run_hooks()
+        self.assertEqual(status, 1, said)
+        self.assertIn("[S532 properties]", said)
 
     def commit_all(self):
         """The status and the output of a commit with the installed hooks."""

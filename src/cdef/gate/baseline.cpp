@@ -93,6 +93,9 @@ baseline::baseline(std::string wanted) : kind(kinds::FILE), place(std::move(want
         place = colon == std::string::npos ? "" : rest.substr(colon + 1);
         if (revision_name.empty() || revision_name.starts_with('-'))
             throw failure("--against git:" + rest + ": not a revision");
+        if (kind == kinds::REVISION_PATH && place.empty())
+            throw failure("--against git:" + rest +
+                          ": expected a path after the second colon; ./ is the class's directory");
         return;
     }
     std::error_code error;
@@ -133,6 +136,8 @@ std::string baseline::name_in_revision(const std::string &path) const {
 
 std::optional<older_version> baseline::in_revision(const std::string &path) const {
     revision at(revision_name, fs::path(path).parent_path().string(), path);
+    if (!at.has_commit())
+        return std::nullopt;
     std::vector<std::string> candidates = {place};
     std::optional<revision::entry> named;
     if (kind == kinds::REVISION) {
@@ -196,10 +201,39 @@ std::vector<older_file> baseline::files_for(const std::string &directory,
     return files;
 }
 
+/* The keys of the files in the directory of a class that are sources, or databases, as the class is. */
+std::set<std::string> baseline::keys_beside(const std::string &path) const {
+    fs::path directory = fs::path(path).parent_path();
+    std::set<std::string> keys;
+    for (const std::string &name : files_in(directory.empty() ? "." : directory.string()))
+        if (is_source(name) == is_source(path))
+            keys.merge(keys_of((directory / name).string()));
+    return keys;
+}
+
+std::vector<older_file> baseline::files_gone_from(const std::string &path) const {
+    std::string directory = fs::path(path).parent_path().string();
+    if (kind == kinds::REVISION)
+        directory = revision(revision_name, directory, path).top();
+    std::vector<older_file> files = files_for(directory, {path});
+    std::set<std::string> present = kind == kinds::REVISION ? std::set<std::string>() : keys_beside(path);
+    auto is_present = [&](const older_file &file) {
+        std::error_code error;
+        return kind == kinds::REVISION ? fs::exists(fs::path(directory) / path_at_revision(file), error)
+                                       : present.contains(file.key);
+    };
+    files.erase(std::remove_if(files.begin(), files.end(), is_present), files.end());
+    return files;
+}
+
+std::string baseline::path_at_revision(const older_file &file) const {
+    return file.name.substr(name_in_revision("").size());
+}
+
 older_version baseline::read(const older_file &file) const {
     if (kind == kinds::DIRECTORY)
         return version_in(file.name);
-    std::string path = file.name.substr(name_in_revision("").size());
+    std::string path = path_at_revision(file);
     revision at(revision_name, file.directory, file.name);
     auto found = at.find(path);
     if (!found || found->is_directory)

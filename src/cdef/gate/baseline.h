@@ -44,6 +44,10 @@ public:
     std::vector<older_file> files_for(const std::string &directory, const std::vector<std::string> &sources) const;
     /* The older version of a class is a file with one of these keys. */
     std::set<std::string> keys_of(const std::string &path) const;
+    /* The sources and databases that the older version of a class may be if it had another name: those anywhere in the
+     * repository, or in the directory of older versions, that the class's repository or directory no longer has. Throws
+     * failure. */
+    std::vector<older_file> files_gone_from(const std::string &path) const;
     /* Throws failure. */
     older_version read(const older_file &file) const;
 
@@ -52,6 +56,8 @@ private:
 
     std::optional<older_version> in_directory(const std::string &path) const;
     std::optional<older_version> in_revision(const std::string &path) const;
+    std::string path_at_revision(const older_file &file) const;
+    std::set<std::string> keys_beside(const std::string &path) const;
     std::vector<std::string> names_for(const std::string &directory) const;
     older_file older_file_of(const std::string &name, const std::string &directory) const;
     /* A path at the revision, as messages name it. */

@@ -5,6 +5,7 @@
 #include "cdef/support/failure.h"
 
 #include <algorithm>
+#include <filesystem>
 #include <utility>
 
 namespace cdef::gate_command {
@@ -31,6 +32,20 @@ void former_files::look_for(const baseline &in, const std::string &directory, co
     for (const older_file &each : in.files_for(directory, sources))
         if (!present.contains(each.key) && noted.emplace(&in, each.key).second)
             files.push_back(read(in, each));
+}
+
+void former_files::look_around(const baseline &in, const std::string &path) {
+    if (!looked.emplace(&in, std::filesystem::path(path).parent_path().string()).second)
+        return;
+    for (const older_file &each : in.files_gone_from(path)) {
+        if (!noted.emplace(&in, each.key).second)
+            continue;
+        older_version old = in.read(each);
+        try {
+            files.push_back({each.path, &in, readable(std::move(old)), {}});
+        } catch (const failure &) { /* its class is not known, so it is not the one that is looked for */
+        }
+    }
 }
 
 const version *former_files::last_of(const baseline &in, const version &now) const {

@@ -29,6 +29,10 @@ public:
     void look_for(const baseline &in, const std::string &directory, const std::vector<std::string> &sources,
                   const std::vector<std::string> &operands);
 
+    /* Notes the files that the older version of a class may be if its file had another name, except those that cannot
+     * be compiled. Throws failure if they cannot be listed or read. */
+    void look_around(const baseline &in, const std::string &path);
+
     /* The older version of a class that is now in another file; null if there is none. */
     const version *last_of(const baseline &in, const version &now) const;
 
@@ -38,7 +42,8 @@ public:
 
 private:
     std::vector<former_file> files;
-    std::set<std::pair<const baseline *, std::string>> noted; /* with their keys */
+    std::set<std::pair<const baseline *, std::string>> noted;  /* with their keys */
+    std::set<std::pair<const baseline *, std::string>> looked; /* around classes in these directories */
 };
 
 } // namespace cdef::gate_command

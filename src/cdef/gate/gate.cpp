@@ -103,6 +103,7 @@ private:
     ids_file *ids_for(const std::string &source, const config::settings &settings);
     void look_at(const operand &what, report::writer &form);
     void report_former(report::writer &form);
+    const version *last_under_another_name(const operand &what, const version &now);
     check::totals judge(const operand &what, report::writer &form);
     static std::vector<gate::numbered> numbers_of(const operand &what, const std::string &named_after,
                                                   const version &now, std::string_view source);
@@ -117,8 +118,9 @@ private:
     std::set<std::string> compared; /* absolute paths of the operands */
     /* The sources in each directory that was given, and what they are compared with. */
     std::map<std::pair<std::string, const baseline *>, std::vector<std::string>> directories;
-    gate_command::former_files former;
-    std::set<std::string> classes; /* names of those that are there */
+    gate_command::former_files former;  /* in the directories that were given */
+    gate_command::former_files renamed; /* elsewhere; only for classes that are new */
+    std::set<std::string> classes;      /* names of those that are there */
     bool pass = true;
     bool read = true;
 };
@@ -215,6 +217,15 @@ std::vector<check::finding> gate_run::breaches(const operand &what, const std::s
     return found;
 }
 
+/* The older version of a class that has a new file; null if there is none. */
+const version *gate_run::last_under_another_name(const operand &what, const version &now) {
+    const version *last = former.last_of(*what.against, now);
+    if (last != nullptr)
+        return last;
+    renamed.look_around(*what.against, what.path);
+    return renamed.last_of(*what.against, now);
+}
+
 check::totals gate_run::judge(const operand &what, report::writer &form) {
     std::optional<older_version> old = what.against == nullptr ? std::nullopt : what.against->version_of(what.path);
     std::unique_ptr<version> before = old ? readable(std::move(*old)) : nullptr;
@@ -234,7 +245,7 @@ check::totals gate_run::judge(const operand &what, report::writer &form) {
         for (std::string &name : now.class_names())
             classes.insert(std::move(name));
         bool is_new = what.against != nullptr && before == nullptr;
-        found = breaches(what, named_after, now, is_new ? former.last_of(*what.against, now) : before.get(), source);
+        found = breaches(what, named_after, now, is_new ? last_under_another_name(what, now) : before.get(), source);
     }
     check::totals count;
     for (const check::finding &each : found) {

@@ -5,6 +5,7 @@
 #include "cdef/gate/git.h"
 #include "cdef/support/failure.h"
 
+#include <algorithm>
 #include <filesystem>
 #include <string_view>
 #include <utility>
@@ -50,16 +51,31 @@ revision::entry entry_of(const std::string &what) {
     return {what.starts_with(DIRECTORY), what.substr(what.rfind(' ') + 1)};
 }
 
+/* True if the branch that HEAD names has no commit yet. */
+bool is_unborn(const std::string &directory) {
+    return git(directory, {"symbolic-ref", "--quiet", "HEAD"}).has_value() &&
+           !git(directory, {"rev-parse", "--quiet", "--verify", "HEAD"}).has_value();
+}
+
 } // namespace
 
 revision::revision(std::string called, std::string in, const std::string &about)
     : name(std::move(called)), directory(std::move(in)) {
     std::optional<std::string> said = git(directory, {"rev-parse", "--show-prefix", "--verify", name + "^{tree}"});
+    if (!said && name == "HEAD" && is_unborn(directory))
+        return;
     std::size_t end = said ? said->find_last_of('\n', said->size() - 2) : std::string::npos;
     if (end == std::string::npos)
         throw failure(about + ": no git repository has it, or its repository has no revision " + name);
     prefix = said->substr(0, end);
     tree = said->substr(end + 1, said->size() - end - 2);
+}
+
+std::string revision::top() const {
+    fs::path up = directory;
+    for (auto levels = std::count(prefix.begin(), prefix.end(), '/'); levels > 0; --levels)
+        up /= "..";
+    return up.string();
 }
 
 void revision::fail(const std::string &path, const std::string &why) const {
@@ -92,6 +108,8 @@ std::optional<std::string> revision::with_link_followed(const std::string &place
 }
 
 std::optional<revision::entry> revision::find(const std::string &path) const {
+    if (!has_commit())
+        return std::nullopt;
     std::string place = normal(is_relative(path) ? fs::path(prefix) / path : fs::path(path));
     bool is_link = false;
     for (int links = 0; links < MOST_LINKS; ++links) {
@@ -122,6 +140,8 @@ std::vector<std::string> revision::names_in(const entry &in, const std::string &
 }
 
 std::vector<std::string> revision::names_below() const {
+    if (!has_commit())
+        return {};
     return texts_in(required(git(directory, {"ls-tree", "-z", "-r", "--name-only", name}), "./"));
 }
 

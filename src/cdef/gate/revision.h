@@ -12,9 +12,16 @@ namespace cdef::gate_command {
  * one that git cannot read: all functions throw failure for the latter. */
 class revision {
 public:
-    /* about: what the revision is needed for, which a failure names. Throws failure if there is no such repository or
-     * revision. */
+    /* about: what the revision is needed for, which a failure names. HEAD has no files before the first commit. Throws
+     * failure if there is no such repository or revision. */
     revision(std::string name, std::string directory, const std::string &about);
+
+    /* False for HEAD before the first commit. */
+    bool has_commit() const {
+        return !tree.empty();
+    }
+    /* The top of the repository, as a path through the directory. */
+    std::string top() const;
 
     struct entry {
         bool is_directory;
@@ -40,7 +47,7 @@ private:
     std::string name;
     std::string directory;
     std::string prefix; /* the directory's path from the top, with a slash; empty: it is the top */
-    std::string tree;   /* the id of the top */
+    std::string tree;   /* the id of the top; empty: there is no commit */
 };
 
 } // namespace cdef::gate_command

@@ -351,6 +351,46 @@ def test_compares_a_class_that_is_in_another_file(world):
     check((status, [each["message"] for each in findings]) == (1, ["- ResourceClass 'Disk' (readers miss it)"]), findings)
 
 
+def test_compares_a_class_whose_file_was_renamed(world):
+    """If only its new file is given, with the file of its name that is gone: in its directory or anywhere in the
+    repository. A file that is still there, or that cannot be compiled, is not its older version."""
+    old, new = with_class(ATTRIBUTE.format("Size", 1, "Int32")), with_class(ATTRIBUTE.format("Size", 2, "Int32"))
+    committed(world, "r", {"p/Disk.cdefsrc": old, "old/Disk.cdefsrc": old, "Wrong.cdefsrc": "wrong"})
+    world.path("r/Wrong.cdefsrc").unlink()
+    repository = world.path("r")
+    for place in ("p", "q", "q/below"):
+        write(world, f"r/{place}/Drive.cdefsrc", new)
+
+    def compared(against, place, expected):
+        at = {"cwd": repository if place == "p" else world.path(f"r/{place}")}
+        operand = "p/Drive.cdefsrc" if place == "p" else "Drive.cdefsrc"
+        status, findings = found(world, "--against", against, operand, **at)
+        check((status, [each["code"] for each in findings]) == expected, against, place, findings)
+    against = {"p": ("git:HEAD", "git:HEAD:old", "git:HEAD:./", "old"), "q": ("git:HEAD",), "q/below": ("git:HEAD",)}
+    compared("git:HEAD", "p", (0, []))
+    compared("git:HEAD:old", "p", (0, []))
+    world.path("r/p/Disk.cdefsrc").unlink()
+    for place, each in ((place, each) for place in against for each in against[place]):
+        compared(each, place, (1, ["CMP102"]))
+    status, findings = found(world, "--against=git:HEAD", "q", cwd=repository)
+    check((status, [each["code"] for each in findings]) == (1, ["CMP102", "CMP102"]), findings)
+
+
+def test_takes_all_classes_as_new_before_the_first_commit(world):
+    """Only for HEAD. A damaged HEAD is not one without a commit."""
+    write(world, "r/p/a.cdefsrc", A)
+    git(world, "init", "-q", "r")
+    repository = world.path("r")
+    for against, operand in (("git:HEAD", "p/a.cdefsrc"), ("git:HEAD", "p")):
+        expect(world.inspect("gate", "--against", against, operand, cwd=repository), 0)
+    refused = b"cdef: p/a.cdefsrc: no git repository has it, or its repository has no revision "
+    expect(world.inspect("gate", "--against=git:v1", "p/a.cdefsrc", cwd=repository), 2, refused + b"v1\n")
+    git(world, "commit", "-qm", "nothing", "--allow-empty", cwd=repository)
+    for each in world.path("r/.git/objects").glob("??/*"):
+        each.unlink()
+    expect(world.inspect("gate", "--against=git:HEAD", "p/a.cdefsrc", cwd=repository), 2, refused + b"HEAD\n")
+
+
 def test_reports_a_class_that_is_gone_from_git(world):
     """From the directory that was given and those below it, or from the directory that is named; not from others."""
     for name, source in (("p/a", A), ("p/below/b", B), ("elsewhere/c", HEAD), ("p/.hidden/d", HEAD)):
@@ -392,6 +432,8 @@ def test_refuses_older_versions_that_are_not_there(world):
     expect(world.inspect("gate", "a.cdefsrc"), 2,
            b"cdef: a.cdefsrc: nothing to compare it with: name an older version with --against\n")
     expect(world.inspect("gate", "--against=git:-x", "a.cdefsrc"), 2, b"cdef: --against git:-x: not a revision\n")
+    expect(world.inspect("gate", "--against=git:HEAD:", "a.cdefsrc"), 2, b"cdef: --against git:HEAD:: expected a path after "
+           b"the second colon; ./ is the class's directory\n")
     missing = b"cdef: a.cdefsrc: no git repository has it, or its repository has no revision HEAD\n"
     expect(world.inspect("gate", "--against=git:HEAD", "a.cdefsrc"), 2, missing)
     without_git = world.inspect("gate", "--against=git:HEAD", "a.cdefsrc", env={"PATH": "/nowhere"})

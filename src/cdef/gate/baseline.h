@@ -32,6 +32,10 @@ public:
 
     /* True if there is one older version for this class and all others that are compared with this. Throws failure. */
     bool is_one_file(const std::string &path) const;
+    /* True if all older versions are in one directory, unless it is a file at a revision. */
+    bool is_one_directory() const {
+        return kind == kinds::DIRECTORY || kind == kinds::REVISION_PATH;
+    }
     /* True if the older version of a class is found by the name of its file. */
     bool goes_by_file_names() const {
         return kind != kinds::FILE;

@@ -56,4 +56,8 @@ const version *former_files::last_of(const baseline &in, const version &now) con
     return found == files.end() ? nullptr : found->last.get();
 }
 
+bool former_files::has_files_of(const baseline &in) const {
+    return std::any_of(files.begin(), files.end(), [&](const former_file &each) { return each.in == &in; });
+}
+
 } // namespace cdef::gate_command

@@ -36,6 +36,8 @@ public:
     /* The older version of a class that is now in another file; null if there is none. */
     const version *last_of(const baseline &in, const version &now) const;
 
+    bool has_files_of(const baseline &in) const;
+
     const std::vector<former_file> &all() const {
         return files;
     }

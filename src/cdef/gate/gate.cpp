@@ -103,6 +103,7 @@ private:
     ids_file *ids_for(const std::string &source, const config::settings &settings);
     void look_at(const operand &what, report::writer &form);
     void report_former(report::writer &form);
+    void mention_unused_directories() const;
     const version *last_under_another_name(const operand &what, const version &now);
     check::totals judge(const operand &what, report::writer &form);
     static std::vector<gate::numbered> numbers_of(const operand &what, const std::string &named_after,
@@ -113,6 +114,7 @@ private:
     const gate_options &options;
     project_files projects;
     std::map<std::string, baseline> baselines; /* by what names them */
+    std::set<const baseline *> used;           /* that have an older version of a class */
     std::map<std::string, ids_file> ids;       /* by path */
     std::vector<operand> operands;
     std::set<std::string> compared; /* absolute paths of the operands */
@@ -220,14 +222,19 @@ std::vector<check::finding> gate_run::breaches(const operand &what, const std::s
 /* The older version of a class that has a new file; null if there is none. */
 const version *gate_run::last_under_another_name(const operand &what, const version &now) {
     const version *last = former.last_of(*what.against, now);
+    if (last == nullptr) {
+        renamed.look_around(*what.against, what.path);
+        last = renamed.last_of(*what.against, now);
+    }
     if (last != nullptr)
-        return last;
-    renamed.look_around(*what.against, what.path);
-    return renamed.last_of(*what.against, now);
+        used.insert(what.against);
+    return last;
 }
 
 check::totals gate_run::judge(const operand &what, report::writer &form) {
     std::optional<older_version> old = what.against == nullptr ? std::nullopt : what.against->version_of(what.path);
+    if (old)
+        used.insert(what.against);
     std::unique_ptr<version> before = old ? readable(std::move(*old)) : nullptr;
     std::string source = text_of_file(what.path);
     std::string named_after = class_name_for(what.path, before.get());
@@ -245,7 +252,8 @@ check::totals gate_run::judge(const operand &what, report::writer &form) {
         for (std::string &name : now.class_names())
             classes.insert(std::move(name));
         bool is_new = what.against != nullptr && before == nullptr;
-        found = breaches(what, named_after, now, is_new ? last_under_another_name(what, now) : before.get(), source);
+        const version *last = is_new ? last_under_another_name(what, now) : before.get();
+        found = breaches(what, named_after, now, last, source);
     }
     check::totals count;
     for (const check::finding &each : found) {
@@ -295,6 +303,15 @@ void gate_run::report_former(report::writer &form) {
     }
 }
 
+/* Such a directory may be the wrong one, or be empty because a download has failed. */
+void gate_run::mention_unused_directories() const {
+    if (!read || options.findings.text.quiet)
+        return;
+    for (const auto &[name, each] : baselines)
+        if (each.is_one_directory() && !used.contains(&each) && !former.has_files_of(each))
+            print_error(name + ": has no older version of any of the classes, which all count as new");
+}
+
 int gate_run::run() {
     find_operands();
     look_for_former();
@@ -303,6 +320,7 @@ int gate_run::run() {
         look_at(each, *form);
     report_former(*form);
     form->close();
+    mention_unused_directories();
     if (options.update)
         for (const auto &[path, file] : ids)
             file.save();

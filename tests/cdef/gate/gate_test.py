@@ -152,17 +152,33 @@ def test_names_a_nameless_class_after_the_older_one(world):
 
 
 def test_looks_for_the_file_in_a_directory(world):
-    """A database is preferred to a source. A new class has no older version."""
+    """A database is preferred to a source. A new class has no older version, which is not an error."""
     old, new = with_class(ATTRIBUTE.format("Size", 1, "Int32")), with_class(ATTRIBUTE.format("Size", 2, "Int32"))
     write(world, "new/a.cdefsrc", new)
-    world.path("old").mkdir()
-    expect(world.inspect("gate", "--against=old", "new/a.cdefsrc"), 0)
+    write(world, "old/b.cdefsrc", B)
+    write(world, "new/b.cdefsrc", B)
+    expect(world.inspect("gate", "--against=old", "new/a.cdefsrc", "new/b.cdefsrc"), 0)
     write(world, "old/a.cdefsrc", old)
     check(codes(found(world, "--against=old", "new")[1]) == {"CMP102"}, "source")
     for name in ("a.cdef", "a.be.cdef"):
         expect(world.inspect("build", "-o", f"old/{name}", "new/a.cdefsrc"), 0)
         expect(world.inspect("gate", "--against=old", "new"), 0)
         world.path(f"old/{name}").unlink()
+
+
+def test_mentions_a_directory_that_has_none_of_the_classes(world):
+    """It may be empty by mistake. A first release still passes; classes that are gone are reported themselves."""
+    committed(world, "r", {"new/a.cdefsrc": A, "none/notes.txt": ""})
+    said = b": has no older version of any of the classes, which all count as new\n"
+    for against in ("none", "git:HEAD:none"):
+        for operand in ("new", "new/a.cdefsrc"):
+            expect(world.inspect("gate", "--against", against, operand, cwd=world.path("r")), 0,
+                   b"cdef: " + against.encode() + said)
+        expect(world.inspect("gate", "-q", "--against", against, "new", cwd=world.path("r")), 0)
+    write(world, "r/new/b.cdefsrc", B)
+    write(world, "r/none/b.cdefsrc", B)
+    expect(world.inspect("gate", "--against=none", "new", cwd=world.path("r")), 0)
+    expect(world.inspect("gate", "--against=git:HEAD", "new", cwd=world.path("r")), 0)
 
 
 def test_finds_the_older_version_of_a_database_of_one_byte_order(world):

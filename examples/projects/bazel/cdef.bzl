@@ -11,8 +11,8 @@ In BUILD, name the databases:
     cdef_database(name = "Disk", src = "Disk.cdefsrc")
 
 The same source makes the same bytes in every workspace and on every machine, so that results can be shared through a
-cache: the class has a Name, the database has no time, and the byte order is that of the machine it is for. An action
-sees cdef, the source and the project file, and no environment variables.
+cache: the class has a Name, the database has no time, and its byte order does not depend on the machine that builds it.
+An action sees cdef, the source and the project file, and no environment variables.
 """
 
 def _cdef_database_impl(ctx):
@@ -75,7 +75,7 @@ def _installed_cdef_impl(repository_ctx):
 
 installed_cdef = repository_rule(
     implementation = _installed_cdef_impl,
-    doc = "The program cdef of this machine. Its contents are an input of each database: another cdef builds them again.",
+    doc = "The program cdef of this machine. If its contents change, all databases are built again.",
     environ = ["CDEF", "PATH"],
     local = True,
 )

@@ -178,7 +178,7 @@ void add_options(command &to, build_options &options) {
         .one_of(names_of_orders());
     to.add("--timestamp", options.timestamp,
            "Time in the database: none, now or SECONDS since 1970; SOURCE_DATE_EPOCH if it is set");
-    to.add("--depfile", options.depfile, "Write to FILE what the databases depend on, as Make reads it");
+    to.add("--depfile", options.depfile, "Write the dependencies of the databases to FILE, for Make or Ninja");
     to.add_number("-j,--jobs", options.jobs, build_command::MOST_JOBS, "Compile this many sources at once");
     to.add_flag("--sync", options.sync, "Wait until each database is on the disk before it replaces the old one");
     to.add_flag("--list", options.list, "List the databases and build none");

@@ -209,8 +209,8 @@ void add_diff(program &app) {
     made.add("A", options->before, "First database; - is standard input").required();
     made.add("B", options->after, "Second database; - is standard input").required();
     made.add_flag("--compat", options->compat,
-                  "Show only differences that break what relies on A, and why: readers (the default), also clients, "
-                  "also stored values")
+                  "Show only differences that break programs or data that rely on A, and why; each level includes "
+                  "those before it, readers is the default")
         .checked(check_level)
         .shown_as("[=LEVEL:{readers,clients,stored}]");
     add_forms(made, options->form, {"text", "json"}, "Form of the differences: text or json");

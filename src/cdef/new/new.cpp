@@ -68,7 +68,7 @@ int write_first_source(const new_options &options) {
 void add_new(program &app) {
     auto options = std::make_shared<new_options>();
     command made =
-        app.add("new", "Writes a source to start a new class from", [options] { return write_first_source(*options); });
+        app.add("new", "Writes a commented source for a new class", [options] { return write_first_source(*options); });
     made.add("KIND", options->kind, "What to write: class").required().one_of({"class"});
     made.add("NAME", options->name, "Name of the class").required();
     made.add("-o,--output", options->file,

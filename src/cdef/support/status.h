@@ -37,8 +37,9 @@ inline constexpr std::array<meanings, 11> statuses = {{
     {"new", "the source is written", "",
      "the source exists or cannot be written, or a source cannot give a class this name"},
     {"explain", "the codes are explained", "", "there is no such code"},
-    {"lsp", "the client has shut the server down and ended it",
-     "the client or its input has ended without that, or the header of a message is wrong",
+    {"lsp", "the client has sent shutdown and then exit",
+     "the client has sent exit without shutdown, the client or its input has ended, or the header of a message is "
+     "wrong",
      "standard input cannot be read"},
 }};
 

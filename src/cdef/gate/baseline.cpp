@@ -55,11 +55,17 @@ bool is_source(std::string_view name) {
     return name.ends_with(".cdefsrc");
 }
 
+/* A link that leads nowhere or to itself counts as a file, so that it is reported as one that cannot be read. */
+bool may_be_file(const fs::path &path) {
+    std::error_code error;
+    return fs::is_regular_file(path, error) || (fs::is_symlink(path, error) && !fs::exists(path, error));
+}
+
 std::vector<std::string> files_in(const std::string &directory) {
     std::vector<std::string> names;
     try {
         for (const fs::directory_entry &each : fs::directory_iterator(directory))
-            if (each.is_regular_file())
+            if (may_be_file(each.path()))
                 names.push_back(each.path().filename().string());
     } catch (const fs::filesystem_error &e) {
         throw failure(directory + ": " + e.code().message());
@@ -123,9 +129,8 @@ std::optional<older_version> baseline::version_of(const std::string &path) const
 }
 
 std::optional<older_version> baseline::in_directory(const std::string &path) const {
-    std::error_code error;
     for (const std::string &name : names_of(path))
-        if (fs::path file = fs::path(place) / name; fs::is_regular_file(file, error))
+        if (fs::path file = fs::path(place) / name; may_be_file(file))
             return version_in(file.string());
     return std::nullopt;
 }

@@ -441,6 +441,18 @@ def test_does_not_know_what_a_damaged_older_version_had(world):
            b"cdef: old/c.cdef: not a sound database; 'cdef verify' says why\n")
 
 
+def test_refuses_links_to_no_older_version(world):
+    """A class is not new because of them. Such a link beside a new source does no harm."""
+    write(world, "new/a.cdefsrc", A)
+    write(world, "old/b.cdefsrc", B)
+    world.path("new/circle.cdefsrc").symlink_to("circle.cdefsrc")
+    expect(world.inspect("gate", "-q", "--against=old", "new/a.cdefsrc"), 0)
+    for link, why in (("nowhere", b"No such file or directory"), ("a.cdef", b"Too many levels of symbolic links")):
+        world.path("old/a.cdef").symlink_to(link)
+        expect(world.inspect("gate", "--against=old", "new/a.cdefsrc"), 2, b"cdef: old/a.cdef: " + why + b"\n")
+        world.path("old/a.cdef").unlink()
+
+
 def test_refuses_older_versions_that_are_not_there(world):
     """Missing files, missing revisions, and no git."""
     write(world, "a.cdefsrc", HEAD)

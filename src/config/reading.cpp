@@ -102,7 +102,9 @@ void value_reader::read_path(const toml::node &value, std::string &to) {
 
 void value_reader::read_baseline(const toml::node &value, std::string &to) {
     const auto *text = value.as_string();
-    if (text != nullptr && text->get().starts_with("git:") && text->get().find('\0') == std::string::npos)
+    if (text != nullptr && text->get() == "git:")
+        report(value.source(), "expected git:REVISION, found " + language::quoted(text->get()));
+    else if (text != nullptr && text->get().starts_with("git:") && text->get().find('\0') == std::string::npos)
         to = text->get();
     else
         read_path(value, to);

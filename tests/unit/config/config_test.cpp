@@ -80,6 +80,7 @@ TEST(Config, RefusesValuesOfOtherTypes) {
                      "cdef.toml:3:11: unknown warning `octla`; did you mean `octal`?",
                      "cdef.toml:4:10: expected true or false, found a string"}));
     EXPECT_EQ(problems("build = 1\n"), texts{"cdef.toml:1:9: expected a table, [build]"});
+    EXPECT_EQ(problems("gate.baseline = 'git:'\n"), texts{"cdef.toml:1:17: expected git:REVISION, found `git:`"});
     EXPECT_EQ(problems("[build]\nbyte-order = 'larg'\ndirectory = ''\n"),
               (texts{"cdef.toml:2:14: expected `native`, `little`, `big` or `both`, found `larg`",
                      "cdef.toml:3:13: the string is empty or has a zero byte"}));

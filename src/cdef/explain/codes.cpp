@@ -38,11 +38,11 @@ explanation explained(const compare::breach_rule &row) {
         "error",
         {},
         row.title,
-        "Whoever relies on the older version is affected: " + std::string(row.reason) +
+        "The change breaks programs or data that rely on the older version: " + std::string(row.reason) +
             ". The rule applies at the level `" + std::string(compare::name_of(row.broken_for)) +
             "` and those after it.",
-        "Take the change back, or add something new and keep the old. If nobody relies on the older version in this "
-        "way, the change is harmless.",
+        "Undo the change, or add something new and keep the old. If nobody relies on the older version in this way, "
+        "the change is harmless.",
         nullptr};
 }
 

@@ -89,12 +89,13 @@ def test_number_that_contradicts_the_file():
 CMP206 = """CMP206: error: a property is gone
 
 Cause:
-  Whoever relies on the older version is affected: clients may rely on the
-  property. The rule applies at the level `clients` and those after it.
+  The change breaks programs or data that rely on the older version: clients may
+  rely on the property. The rule applies at the level `clients` and those after
+  it.
 
 Cure:
-  Take the change back, or add something new and keep the old. If nobody relies
-  on the older version in this way, the change is harmless.
+  Undo the change, or add something new and keep the old. If nobody relies on
+  the older version in this way, the change is harmless.
 """
 
 

@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <charconv>
 #include <limits>
+#include <set>
 #include <system_error>
 
 namespace source_index {
@@ -71,9 +72,9 @@ bool shares_numbers(const stanza &one, const stanza &other) {
            number_family(one.kind) == number_family(other.kind);
 }
 
-/* Nothing for a text that is not a number, or is too large for a record. As for the compiler, 0x means hexadecimal, and
- * 0 in front of other digits octal. */
-std::optional<long long> number_in(std::string_view text) {
+/* The Id that a record gets: the low 32 bits. Nothing for a text that is not a number. As for the compiler, 0x means
+ * hexadecimal, and 0 in front of other digits octal. */
+std::optional<vx_int32_t> number_in(std::string_view text) {
     constexpr int DECIMAL = 10;
     constexpr int OCTAL = 8;
     constexpr int HEXADECIMAL = 16;
@@ -83,9 +84,8 @@ std::optional<long long> number_in(std::string_view text) {
         text.remove_prefix(2);
     }
     long long number = 0;
-    auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number, base);
-    bool fits = error == std::errc() && number >= 0 && number < std::numeric_limits<vx_int32_t>::max();
-    return fits && end != text.data() ? std::optional(number) : std::nullopt;
+    auto error = std::from_chars(text.data(), text.data() + text.size(), number, base).ec;
+    return error == std::errc() ? std::optional(static_cast<vx_int32_t>(number)) : std::nullopt;
 }
 
 } // namespace
@@ -143,15 +143,21 @@ std::optional<long long> index::next_id(std::string_view source, const stanza &o
         });
     if (!of.is_known() || find_attr(of.row(), "Id") == nullptr)
         return std::nullopt;
-    long long highest = -1;
+    std::set<vx_int32_t> used;
     for (const stanza &each : stanzas)
         if (shares_numbers(each, of))
-            highest = std::max(highest, number_in(each.value(source, "Id")).value_or(-1));
-    return highest + 1;
+            used.insert(number_in(each.value(source, "Id")).value_or(-1));
+    vx_int32_t highest = used.empty() ? -1 : *used.rbegin();
+    if (highest < std::numeric_limits<vx_int32_t>::max())
+        return std::max(highest, -1) + 1LL;
+    long long gap = 0;
+    while (used.contains(static_cast<vx_int32_t>(gap)))
+        ++gap;
+    return gap;
 }
 
 bool index::is_free_id(std::string_view source, const stanza &of) const {
-    std::optional<long long> number = number_in(of.value(source, "Id"));
+    std::optional<vx_int32_t> number = number_in(of.value(source, "Id"));
     return number && std::none_of(stanzas.begin(), stanzas.end(), [&](const stanza &each) {
                return shares_numbers(each, of) && number_in(each.value(source, "Id")) == number;
            });

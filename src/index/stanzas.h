@@ -62,8 +62,9 @@ struct index {
     const attribute *attribute_at(std::size_t line) const;
     /* All of a stanza, from its header to the end of its last line. */
     span extent_of(const stanza &of) const;
-    /* The number after the highest one in use by stanzas of this kind in the class. Persistent and dynamic attributes
-     * of a level share their numbers. An element's number is its place in its run, counted from 0. */
+    /* The number after the highest one in use by stanzas of this kind in the class or, if that is the largest of all,
+     * the lowest free one. Persistent and dynamic attributes of a level share their numbers. An element's number is its
+     * place in its run, counted from 0. */
     std::optional<long long> next_id(std::string_view source, const stanza &of) const;
     /* Whether a stanza's Id is a number that no other stanza has. */
     bool is_free_id(std::string_view source, const stanza &of) const;

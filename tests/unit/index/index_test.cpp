@@ -7,6 +7,7 @@
 #include <gtest/gtest.h>
 
 #include <string>
+#include <utility>
 
 namespace {
 
@@ -160,6 +161,23 @@ TEST(Numbers, AreReadAsTheCompilerReadsThem) {
     EXPECT_FALSE(whole.is_free_id(source, whole.stanzas[3]));
     EXPECT_FALSE(whole.is_free_id(source, whole.stanzas[4]));
     EXPECT_TRUE(whole.is_free_id(source, whole.stanzas[1]));
+}
+
+/* Whether the first of two actions with these Ids has one of its own, and the number that the second one may have. */
+std::pair<bool, long long> free_and_next(const std::string &one, const std::string &other) {
+    std::string source = "ControlDefinition\nResourceAction\n\tId=" + one + "\nResourceAction\n\tId=" + other + "\n";
+    source_index::index whole = source_index::index_of(source);
+    return {whole.is_free_id(source, whole.stanzas[1]), whole.next_id(source, whole.stanzas[2]).value()};
+}
+
+TEST(Numbers, MayBeLarge) {
+    using result = std::pair<bool, long long>;
+    EXPECT_EQ(free_and_next("2147483646", "0"), (result{true, 2147483647}));
+    EXPECT_EQ(free_and_next("2147483647", "1"), (result{true, 0}));
+    EXPECT_EQ(free_and_next("0x7fffffff", "2147483647"), (result{false, 0}));
+    EXPECT_EQ(free_and_next("4294967295", "0x80000000"), (result{true, 0}));
+    EXPECT_EQ(free_and_next("0x80000000", "2147483648"), (result{false, 0}));
+    EXPECT_EQ(free_and_next("4294967301", "5"), (result{false, 6})); /* 5 and 2 to the power of 32 */
 }
 
 TEST(Numbers, OfElementsCountInTheirRun) {

@@ -33,7 +33,8 @@ json parsed(std::string_view body) {
     if (nesting_of(body) > NESTING_MAX)
         throw request_error(INVALID_REQUEST, "the message is nested too deeply");
     json message = json::parse(body, nullptr, false);
-    if (message.is_discarded())
+    bool has_zero = body.find('\0') != std::string_view::npos; /* where the parser would take the body to end */
+    if (message.is_discarded() || has_zero)
         throw request_error(PARSE_ERROR, "the message is not JSON");
     return message;
 }

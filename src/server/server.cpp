@@ -261,8 +261,7 @@ void server::handle_notification(const json &message) {
             if (each.method == method)
                 each.take(now, params_of(message));
     } catch (const request_error &wrong) {
-        constexpr int LOG_WARNING = 2;
-        now.send(notification("window/logMessage", {{"type", LOG_WARNING}, {"message", method + ": " + wrong.what()}}));
+        now.log(method + ": " + wrong.what());
     }
 }
 

@@ -26,12 +26,17 @@ struct message_number {
     std::string number;
 };
 
+/* The sources in a folder and the folders in it, as paths, in order. */
+struct source_list {
+    std::vector<std::string> paths;
+    bool is_complete = true; /* false: there may be more, because the search ended early */
+};
+
 /* The functions and settings that the server gets from the program. */
 struct surroundings {
     /* The bytes of a file; nothing if it cannot be read. */
     std::function<std::optional<std::string>(const std::string &path)> read;
-    /* The sources in a folder and the folders in it, as paths, in order. */
-    std::function<std::vector<std::string>(const std::string &folder)> sources_in;
+    std::function<source_list(const std::string &folder)> sources_in;
     std::string explanations;                     /* URI of the page that explains the codes; empty: there is none */
     std::string version;                          /* of the program */
     std::optional<std::string> project_file = {}; /* read instead of all others; empty: none is read */
@@ -66,6 +71,11 @@ struct session {
     }
     void send(const json &message) {
         outbox.push_back(written(message));
+    }
+    /* Sends a warning for the log that the client shows. */
+    void log(const std::string &text) {
+        constexpr int WARNING = 2;
+        send(notification("window/logMessage", {{"type", WARNING}, {"message", text}}));
     }
     /* Sends a request of the server. Returns its identifier. */
     std::string ask(std::string_view method, json params) {

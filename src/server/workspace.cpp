@@ -46,16 +46,21 @@ std::string without_links(const std::string &path) {
 } // namespace
 
 bool workspace::is_in_folder(const std::string &path) const {
-    return std::any_of(folders.begin(), folders.end(), [&](const std::string &each) { return path.starts_with(each); });
+    return std::any_of(folders.begin(), folders.end(), [&](const std::string &each) {
+        return path.starts_with(each) && path.find("/.", each.size() - 1) == std::string::npos;
+    });
 }
 
 void workspace::add_folder(session &now, const std::string &path) {
     if (!folders.insert(with_slash(path)).second)
         return;
-    for (const std::string &each : now.world.sources_in(path)) {
+    source_list found = now.world.sources_in(path);
+    for (const std::string &each : found.paths) {
         known.try_emplace(each);
         waiting.insert(each);
     }
+    if (!found.is_complete)
+        now.log(path + ": too many files; only " + std::to_string(found.paths.size()) + " sources are checked");
     ask_for_progress(now);
 }
 

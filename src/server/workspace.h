@@ -48,6 +48,7 @@ public:
         waiting.insert(path);
     }
     void look_at_all();
+    /* Hidden files, and those in hidden directories of a folder, are not. */
     bool is_in_folder(const std::string &path) const;
 
     bool has_work() const {

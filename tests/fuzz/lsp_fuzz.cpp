@@ -73,7 +73,7 @@ private:
     }
 
     lsp::server server{{.read = [](const std::string &) { return std::nullopt; },
-                        .sources_in = [](const std::string &) { return std::vector<std::string>(); },
+                        .sources_in = [](const std::string &) { return lsp::source_list(); },
                         .explanations = "file:///codes",
                         .version = "0",
                         .project_file = ""}};

@@ -30,21 +30,24 @@ std::optional<std::string> bytes_of_file(const std::string &path) {
     }
 }
 
-std::vector<std::string> sources_below(const std::string &folder, const search_limits &limits) {
+lsp::source_list sources_below(const std::string &folder, const search_limits &limits) {
     using std::filesystem::recursive_directory_iterator;
-    std::vector<std::string> found;
+    lsp::source_list found;
     std::error_code failed;
     recursive_directory_iterator end;
     recursive_directory_iterator at(folder, std::filesystem::directory_options::skip_permission_denied, failed);
-    for (std::size_t seen = 0; !failed && at != end && seen < limits.entries && found.size() < limits.sources; ++seen) {
+    for (std::size_t seen = 0; !failed && at != end; ++seen) {
+        found.is_complete = seen < limits.entries && found.paths.size() < limits.sources;
+        if (!found.is_complete)
+            break;
         std::error_code unknown;
-        if (at->is_directory(unknown) && at->path().filename().native().starts_with('.'))
+        if (at->path().filename().native().starts_with('.'))
             at.disable_recursion_pending();
         else if (at->path().extension() == ".cdefsrc" && at->is_regular_file(unknown))
-            found.push_back(at->path().string());
+            found.paths.push_back(at->path().string());
         at.increment(failed);
     }
-    std::sort(found.begin(), found.end());
+    std::sort(found.paths.begin(), found.paths.end());
     return found;
 }
 

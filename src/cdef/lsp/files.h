@@ -2,10 +2,11 @@
 #ifndef CDGEN_CDEF_LSP_FILES_H
 #define CDGEN_CDEF_LSP_FILES_H
 
+#include "server/session.h"
+
 #include <cstddef>
 #include <optional>
 #include <string>
-#include <vector>
 
 namespace cdef {
 
@@ -18,9 +19,9 @@ struct search_limits {
     std::size_t sources = 20'000;
 };
 
-/* The sources in a folder and in the folders below it, in order. Links to folders are not followed, and hidden folders
+/* The sources in a folder and in the folders below it. Links to folders are not followed, and hidden files and folders
  * are left out. */
-std::vector<std::string> sources_below(const std::string &folder, const search_limits &limits = {});
+lsp::source_list sources_below(const std::string &folder, const search_limits &limits = {});
 
 /* URI of the installed page that explains the codes; empty if it is not installed. */
 std::string explanations_page();

@@ -131,6 +131,7 @@ def test_frame_that_is_too_large_is_refused_alone():
     (b'{"jsonrpc": "2.0", "id": null, "method": "a"}', -32600), (b'{"jsonrpc": "2.0", "id": [], "method": "a"}', -32600),
     (b'{"method": "$/cancelRequest"}', -32600), (b'{"jsonrpc": "1.0", "method": "exit"}', -32600),
     (b'{"jsonrpc": 2.0, "id": 7, "result": null}', -32600),
+    (frame(SHUTDOWN).split(b"\r\n\r\n")[1] + b"\0", -32700), (frame(SHUTDOWN).split(b"\r\n\r\n")[1] + b"\0{", -32700),
 ], ids=itertools.count())
 def test_what_is_no_message_is_refused_alone(body, code):
     assert codes(talk(frame(body) + frame(INITIALIZE))[0]) == [(None, code), (1, None)]
@@ -223,6 +224,8 @@ def test_escapes_in_a_uri_do_not_matter():
 
 @pytest.mark.parametrize("wrong", [
     {"range": {"start": {"line": 0, "character": 0}, "end": {"line": -1, "character": 0}}, "text": ""}, {"text": 1}, {}, 1,
+    {"range": {"start": {"line": 1, "character": 0}, "end": {"line": 0, "character": 3}}, "text": ""},
+    {"range": {"start": {"line": 0, "character": 3}, "end": {"line": 0, "character": 2}}, "text": ""},
 ], ids=itertools.count())
 def test_of_a_malformed_message_no_change_is_applied(wrong):
     with Client() as client:

@@ -120,6 +120,50 @@ def test_open_document_counts_in_the_place_of_its_file(folder):
         wait_for(client, path, ["S611"])
 
 
+def test_hidden_sources_are_not_of_the_folder(folder):
+    """Even if the editor mentions or opens them. `cdef build` leaves them out, too."""
+    (folder / ".a.cdefsrc").write_text(PUMP)
+    with Client(root=folder, capabilities=ABLE) as client:
+        wait_for(client, folder / "deep/b.cdefsrc", ["S611"])
+        client.notify("workspace/didChangeWatchedFiles", changes=[
+            {"uri": uri_of(folder / name), "type": 2} for name in (".a.cdefsrc", ".hidden/c.cdefsrc")])
+        client.open(uri_of(folder / ".hidden/c.cdefsrc"), "nonsense\n")
+        wait_for(client, folder / ".hidden/c.cdefsrc", ["S101"])
+        client.notify("textDocument/didClose", textDocument={"uri": uri_of(folder / ".hidden/c.cdefsrc")})
+        wait_for(client, folder / ".hidden/c.cdefsrc", [])
+        settle(client)
+        assert uri_of(folder / ".a.cdefsrc") not in client.published
+        assert [uri for uri, _, _ in related(client, folder / "deep/b.cdefsrc")] == [uri_of(folder / "a.cdefsrc")]
+
+
+def test_findings_stay_under_no_other_spelling_of_a_uri(folder):
+    """Editors escape other characters than the server."""
+    path = folder / "a@+(1).cdefsrc"
+    path.write_text("nonsense\n")
+    other, own = "file://" + str(path), "file://" + str(folder) + "/a%40%2B%281%29.cdefsrc"
+    with Client(root=folder) as client:
+        def wait(uri, expected):
+            while [each["code"] for each in client.published.get(uri, {"diagnostics": []})["diagnostics"]] != expected:
+                client.next()
+
+        wait(own, ["S101"])
+        client.open(other, "nonsense\n")
+        wait(other, ["S101"])
+        assert client.published[own]["diagnostics"] == []
+        client.notify("textDocument/didClose", textDocument={"uri": other})
+        wait(own, ["S101"])
+        assert client.published[other]["diagnostics"] == []
+
+
+def test_document_in_a_folder_that_is_not_a_source_loses_its_findings(folder):
+    path = folder / "a.txt"
+    with Client(root=folder) as client:
+        client.open(uri_of(path), "nonsense\n")
+        wait_for(client, path, ["S101"])
+        client.notify("textDocument/didClose", textDocument={"uri": uri_of(path)})
+        wait_for(client, path, [])
+
+
 def test_watched_files(folder):
     """The client says what has changed on the disk."""
     path = folder / "deep/b.cdefsrc"

@@ -33,7 +33,7 @@ const json INITIALIZE = request(1, "initialize", {{"capabilities", json::object(
 lsp::surroundings nothing() {
     lsp::surroundings world;
     world.read = [](const std::string &) { return std::nullopt; };
-    world.sources_in = [](const std::string &) { return std::vector<std::string>(); };
+    world.sources_in = [](const std::string &) { return lsp::source_list(); };
     world.project_file = "";
     return world;
 }
@@ -87,7 +87,7 @@ TEST(Server, AnswersAMessageWithAnIdentifierButNoMethod) {
 std::vector<std::string> progress_after(const json &answer) {
     lsp::surroundings world = nothing();
     world.read = [](const std::string &) { return found_in::CLASS; };
-    world.sources_in = [](const std::string &) { return std::vector<std::string>{"/x/a.cdefsrc"}; };
+    world.sources_in = [](const std::string &) { return lsp::source_list{{"/x/a.cdefsrc"}}; };
     lsp::server server(world);
     json able = {{"capabilities", {{"window", {{"workDoneProgress", true}}}}}, {"rootUri", "file:///x"}};
     json asked;
@@ -107,6 +107,35 @@ std::vector<std::string> progress_after(const json &answer) {
 TEST(Server, ReportsProgressOnlyAfterTheClientHasAgreed) {
     EXPECT_EQ(progress_after({{"result", nullptr}}), (std::vector<std::string>{"begin", "end"}));
     EXPECT_EQ(progress_after({{"error", {{"code", -32803}, {"message", "no"}}}}), std::vector<std::string>());
+}
+
+TEST(Server, ChecksNoMoreSourcesAfterItsProgressIsCancelled) {
+    int reads = 0;
+    lsp::surroundings world = nothing();
+    world.read = [&](const std::string &) { return ++reads, found_in::CLASS; };
+    world.sources_in = [](const std::string &) { return lsp::source_list{{"/x/a.cdefsrc", "/x/b.cdefsrc"}}; };
+    lsp::server server(world);
+    json able = {{"capabilities", {{"window", {{"workDoneProgress", true}}}}}, {"rootUri", "file:///x"}};
+    json cancel = {{"method", "window/workDoneProgress/cancel"}, {"params", {{"token", "cdef/sources"}}}};
+    std::vector<std::string> kinds;
+    for (const json &each : said(server, {request(1, "initialize", able),
+                                          {{"method", "initialized"}},
+                                          {{"id", "cdef/1"}, {"result", nullptr}},
+                                          cancel}))
+        if (each.value("method", "") == "$/progress")
+            kinds.push_back(each.at("params").at("value").at("kind"));
+    EXPECT_EQ(kinds, (std::vector<std::string>{"begin", "end"}));
+    EXPECT_EQ(reads, 0);
+}
+
+TEST(Server, LogsThatAFolderIsTooLarge) {
+    lsp::surroundings world = nothing();
+    world.sources_in = [](const std::string &) { return lsp::source_list{{"/x/a.cdefsrc"}, false}; };
+    lsp::server server(world);
+    json folder = {{"capabilities", json::object()}, {"rootUri", "file:///x"}};
+    std::vector<json> all = said(server, {request(1, "initialize", folder), {{"method", "initialized"}}});
+    EXPECT_EQ(all.at(1).at("method"), "window/logMessage");
+    EXPECT_EQ(all[1].at("params").at("message"), "/x: too many files; only 1 sources are checked");
 }
 
 TEST(Server, WaitsForNoMoreThanItCanHold) {

@@ -50,8 +50,10 @@ public:
     json collect() {
         if (is_wanted(params, QUICK_FIX)) {
             add_corrections();
-            add_missing_lines();
-            add_free_number();
+            for (const source_index::stanza *each : stanzas_in_range()) {
+                add_missing_lines(*each);
+                add_free_number(*each);
+            }
         }
         if (is_wanted(params, REWRITE))
             add_quotes();
@@ -69,8 +71,9 @@ private:
         return byte_edit(in, now.client.units, at, std::move(by));
     }
     void add_corrections();
-    void add_missing_lines();
-    void add_free_number();
+    std::vector<const source_index::stanza *> stanzas_in_range() const;
+    void add_missing_lines(const source_index::stanza &of);
+    void add_free_number(const source_index::stanza &of);
     void add_quotes();
     void add_all_corrections();
 
@@ -143,22 +146,39 @@ std::size_t line_before_missing(const source_index::stanza &of) {
     return line;
 }
 
-void collector::add_missing_lines() {
-    place_in_source place = place_at(in, part.begin);
-    if (place.stanza == nullptr || !place.stanza->is_known() || may_continue(in, *place.stanza) ||
-        has_unknown_line(*place.stanza))
+/* The stanzas that the range touches. Of very many the first ones: each takes time, and nobody reads so long a list. */
+std::vector<const source_index::stanza *> collector::stanzas_in_range() const {
+    constexpr std::size_t STANZAS_MAX = 100;
+    const source_index::index &index = in.index();
+    std::vector<const source_index::stanza *> found;
+    if (index.lines.empty())
+        return found;
+    std::size_t first = index.stanza_at(index.line_at(part.begin));
+    std::size_t last = index.line_at(part.end);
+    for (std::size_t at = first == source_index::NONE ? 0 : first; at < index.stanzas.size(); ++at) {
+        const source_index::stanza &each = index.stanzas[at];
+        if (each.first_line > last || found.size() == STANZAS_MAX)
+            break;
+        if (each.is_known())
+            found.push_back(&each);
+    }
+    return found;
+}
+
+void collector::add_missing_lines(const source_index::stanza &of) {
+    if (may_continue(in, of) || has_unknown_line(of))
         return;
-    std::vector<const table_attrs *> missing = missing_in(*place.stanza);
+    std::vector<const table_attrs *> missing = missing_in(of);
     if (missing.empty())
         return;
     std::string lines;
     language::name_list names;
     for (const table_attrs *each : missing) {
-        lines += "\n\t" + std::string(each->ta_name) + "=" + example_value(in.text(), in.index(), *place.stanza, *each);
+        lines += "\n\t" + std::string(each->ta_name) + "=" + example_value(in.text(), in.index(), of, *each);
         names.push_back(each->ta_name);
     }
     /* A long line has several in the index. */
-    std::size_t end = in.text().find('\n', in.index().lines[line_before_missing(*place.stanza)].whole.end);
+    std::size_t end = in.text().find('\n', in.index().lines[line_before_missing(of)].whole.end);
     end = std::min(end, in.text().size());
     add("Add " + language::listed(names), QUICK_FIX, json::array({edit({end, end}, lines)}));
 }
@@ -176,19 +196,20 @@ bool follows_right_elements(document &in, const source_index::stanza &element) {
     return true;
 }
 
-void collector::add_free_number() {
-    place_in_source place = place_at(in, part.begin);
-    bool numbered = place.has_known_attribute() && place.attribute->parts.has_equals &&
-                    (place.attribute->known->ta_type == AT_ID || place.attribute->known->ta_type == AT_SD_INDEX);
-    if (!numbered)
+void collector::add_free_number(const source_index::stanza &of) {
+    const source_index::attribute *number = of.find(of.is_element() ? "ElementIndex" : "Id");
+    if (number == nullptr || !number->parts.has_equals)
         return;
-    bool replaceable = place.stanza->is_element() ? follows_right_elements(in, *place.stanza)
-                                                  : !in.index().is_free_id(in.text(), *place.stanza);
+    const stretch &line = in.index().lines[number->line].whole;
+    if (line.begin > part.end || line.end < part.begin)
+        return;
+    bool replaceable = of.is_element() ? follows_right_elements(in, of) : !in.index().is_free_id(in.text(), of);
     if (!replaceable)
         return;
-    std::string next = example_value(in.text(), in.index(), *place.stanza, *place.attribute->known);
-    if (place.attribute->parts.value.of(in.text()) != next)
-        add("Use the next free number, " + next, QUICK_FIX, json::array({edit(place.attribute->parts.value, next)}));
+    std::string next = example_value(in.text(), in.index(), of, *number->known);
+    if (number->parts.value.of(in.text()) != next)
+        add((of.is_element() ? "Use the element's place, " : "Use the next free number, ") + next, QUICK_FIX,
+            json::array({edit(number->parts.value, next)}));
 }
 
 /* Only if the value is the same with quotes. */

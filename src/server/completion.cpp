@@ -410,7 +410,8 @@ void add_by_type(items &to, const place_in_source &place, const stretch &part) {
     case AT_ID:
     case AT_SD_INDEX: {
         std::string next = example_value(place.text(), place.in.index(), in, attr);
-        to.add(next, VALUE, next, attribute_documentation(in.row(), attr))["detail"] = "next free number";
+        to.add(next, VALUE, next, attribute_documentation(in.row(), attr))["detail"] =
+            in.is_element() ? "the element's place" : "next free number";
         return;
     }
     case AT_PERMISSION:

@@ -746,6 +746,30 @@ def test_next_free_number(pump):
     assert made["Use the next free number, 5"] == PUMP.replace("Id=7", "Id=5")
 
 
+@pytest.mark.parametrize("number", [2147483646, 2147483647, "0x7fffffff", 4294967295, "0x80000000"])
+def test_large_numbers_that_are_free_stay(pump, number):
+    text = PUMP.replace("Id=7", f"Id={number}")
+    show(pump, text)
+    assert actions(pump, f"\tId=|{number}", text, only=["quickfix"])[0] == {}
+
+
+def test_actions_for_a_selection(pump):
+    """Of all stanzas and numbers in it, wherever it begins."""
+    text = (PUMP.replace("\tId=7", "\tId=4").replace("\tDescription=9\n", "").replace("\tLastKey=2\n", "")
+            .replace("\tDescription=11\n", ""))
+    show(pump, text)
+    begin, end = position(text, text.index("DynamicResource")), position(text, text.index("\tDisplayName=12") + 4)
+    found = pump.about("textDocument/codeAction", URI, range={"start": begin, "end": end},
+                       context={"diagnostics": [], "only": ["quickfix"]})
+    made = [(each["title"], edited(text, edits_in(each["edit"])[URI])) for each in found if "diagnostics" not in each]
+    with_description = "\tVarietyRange=1,1\n\tDescription=0\nActionIn"
+    same(made, [
+        ("Use the next free number, 5", text.replace("\tId=4\n\tDataType=SD", "\tId=5\n\tDataType=SD")),
+        ("Add `Description`", text.replace("\tVarietyRange=1,1\nActionIn", with_description)),
+        ("Add `Description`", text.replace("UInt32\nClass", "UInt32\n\tDescription=0\nClass")),
+    ], "actions")
+
+
 @pytest.mark.parametrize("words", ["\tId=|7", "\tElementIndex=|0\n\tDataType=UInt32\nResourceAction"])
 def test_numbers_that_are_right_stay(pump, words):
     assert actions(pump, words, PUMP, only=["quickfix"])[0] == {}
@@ -758,7 +782,7 @@ def test_index_of_an_element_is_its_place(pump):
     text = PUMP.replace("ResourceAction\n", TWO % 7 + "ResourceAction\n")
     show(pump, text)
     made, _ = actions(pump, "\tElementIndex=|7", text, only=["quickfix"])
-    assert made["Use the next free number, 1"] == text.replace("=7\n\tDataType=UInt32", "=1\n\tDataType=UInt32")
+    assert made["Use the element's place, 1"] == text.replace("=7\n\tDataType=UInt32", "=1\n\tDataType=UInt32")
     short = text.replace("\tElementIndex=0\n\tDataType=UInt32\nDAttr", "\tDataType=UInt32\nDAttr")
     show(pump, short)
     made, _ = actions(pump, "ElementName=Tu|rns", short, only=["quickfix"])
@@ -770,7 +794,7 @@ def test_the_first_wrong_index_of_a_run_is_corrected_first(pump):
     text = PUMP.replace("ResourceAction\n", TWO % 2 + TWO.replace("Hours", "Days") % 3 + "ResourceAction\n")
     show(pump, text)
     made, _ = actions(pump, "\tElementIndex=|2", text, only=["quickfix"])
-    assert "Use the next free number, 1" in made
+    assert "Use the element's place, 1" in made
     made, _ = actions(pump, "\tElementIndex=|3", text, only=["quickfix"])
     assert not [each for each in made if each.startswith("Use")]
 

@@ -125,9 +125,13 @@ def place_of(chooser, text, at, encoding):
     return {**where, "character": where["character"] + chooser.randrange(inside + 1)}
 
 
+# Nothing of a message with such a change is applied.
+REVERSED = {"range": {"start": {"line": 1, "character": 0}, "end": {"line": 0, "character": 9}}, "text": "x"}
+
+
 def edit(chooser, text, encoding):
-    """A change, and the text that results from it. No position is between a carriage return and its newline, but a change
-    may bring the two together."""
+    """A change, and the text that results from it. Its range never ends before it begins, which would be malformed. No
+    position is between a carriage return and its newline, but a change may bring the two together."""
     begin, end = sorted(within_end(text, chooser.randrange(len(text) + 1)) for _ in range(2))
     end = within_end(text, min(end, begin + chooser.randrange(40)))
     end = max(begin, end)
@@ -135,7 +139,8 @@ def edit(chooser, text, encoding):
     if newlines and chooser.randrange(8) == 0:
         begin = end = within_end(text, chooser.choice(newlines))
     new = chooser.choice(("", "\n", "\r", "\r\n", "\t", "=", "\"", "Id", *LETTERS, text[begin:end] * 2, text[:30]))
-    start, stop = place_of(chooser, text, begin, encoding), place_of(chooser, text, end, encoding)
+    places = (place_of(chooser, text, begin, encoding), place_of(chooser, text, end, encoding))
+    start, stop = sorted(places, key=lambda place: (place["line"], place["character"]))
     change = {"range": {"start": start, "end": stop}, "text": new}
     return change, text[:begin] + new + text[end:]
 
@@ -156,6 +161,8 @@ def test_edits_end_in_the_state_of_a_fresh_open(group):
                 for _ in range(chooser.randrange(1, 4)):
                     change, text = edit(chooser, text, encoding)
                     changes.append(change)
+                if chooser.randrange(4) == 0:
+                    client.change(edited, version, changes[0], REVERSED)
                 client.change(edited, version, *changes)
             client.open(fresh, text)
             same = shown(client, edited, version) == shown(client, fresh, 1)

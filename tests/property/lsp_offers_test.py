@@ -1,5 +1,5 @@
-"""Test that nothing that `cdef lsp` offers makes a source worse: every code action of every line, and every stanza that is
-completed where a stanza may be.
+"""Test that nothing that `cdef lsp` offers makes a source worse: every code action of every line, every stanza that is
+completed where a stanza may be, and values that are completed.
 
 The sources are the class of `docs/language.md`, the examples, the cases of `golden` and of `cdef/check`, and generated
 ones. "Worse" means: more errors or, with as many errors, more warnings.
@@ -27,6 +27,8 @@ UNAVOIDABLE = ("S530", "S514", "S503")
 # nothing reports as long as it is the last.
 BRITTLE = ("negative-float-overflow-accepted.cdefsrc", "values-narrowed.cdefsrc", "control-definition-only.cdefsrc",
            "sbs-attributes-flushed.cdefsrc")
+# Another value may contradict other lines. It must not break its own, nor be a name that nothing has.
+BROKEN_LINE = ("S101", "S103", "S104", "S106", "S504", "S505", "S520", "S522", "S533")
 ROOT = pathlib.Path(__file__).parents[2]
 FOLDERS = ("examples", "tests/golden", "tests/cdef/check")
 PLAIN = {key: value for key, value in CAPABILITIES.items() if key != "textDocument"}
@@ -64,8 +66,8 @@ def sources(group):
 class Judge:
     """Compares texts by their findings."""
 
-    def __init__(self, client, unavoidable=()):
-        self.client, self.unavoidable, self.known, self.number = client, unavoidable, {}, 0
+    def __init__(self, client, unavoidable=(), counted=None):
+        self.client, self.unavoidable, self.counted, self.known, self.number = client, unavoidable, counted, {}, 0
 
     def badness(self, text):
         """(errors, warnings)"""
@@ -74,7 +76,7 @@ class Judge:
             uri = f"file:///judged/{self.number}.cdefsrc"
             self.client.open(uri, text)
             severities = [each["severity"] for each in self.client.diagnostics(uri)
-                          if each["code"] not in self.unavoidable]
+                          if each["code"] not in self.unavoidable and each["code"] in (self.counted or each["code"])]
             self.client.notify("textDocument/didClose", textDocument={"uri": uri})
             self.known[text] = (severities.count(1), severities.count(2))
         return self.known[text]
@@ -124,5 +126,42 @@ def test_stanzas_make_nothing_worse(group):
                     after = edited(here, [item["textEdit"]])
                     if judge.badness(after) > judge.badness(here):
                         worse.append((name, line, item["label"], judge.badness(here), judge.badness(after)))
+            client.notify("textDocument/didClose", textDocument={"uri": uri})
+    none(worse)
+
+
+def value_places(line):
+    """The line, and columns in it: its beginning, and in and around its value; also with a comment after it."""
+    begin = line.index("=") + 1
+    for text in (line, line + "  # c"):
+        columns = {begin, (begin + len(line)) // 2, len(line), max(begin, len(text) - 3)}
+        yield text, [0, *sorted(columns)]
+
+
+@pytest.mark.slow(20)
+@pytest.mark.parametrize("group", range(GROUPS))
+def test_values_break_no_line(group):
+    """The first and the last item at each place of each attribute line."""
+    worse = []
+    with Client(capabilities=PLAIN) as client:
+        judge = Judge(client, counted=BROKEN_LINE)
+        for name, text in sources(group):
+            uri, version, lines = "file:///offers.cdefsrc", 1, text.split("\n")
+            if judge.badness(text)[0] > 0 or name in BRITTLE:
+                continue
+            client.open(uri, text)
+            for at, line in enumerate(lines):
+                if not line[:1].isspace() or "=" not in line or "#" in line or not line.isascii():
+                    continue
+                for changed, columns in value_places(line):
+                    version += 1
+                    here = "\n".join([*lines[:at], changed, *lines[at + 1:]])
+                    client.change(uri, version, here)
+                    for column in columns:
+                        items = client.at("textDocument/completion", uri, at, column)
+                        for item in [*items[:1], *items[1:][-1:]]:
+                            after = edited(here, [item["textEdit"]])
+                            if judge.badness(after) > judge.badness(here):
+                                worse.append((name, changed, column, item["label"]))
             client.notify("textDocument/didClose", textDocument={"uri": uri})
     none(worse)

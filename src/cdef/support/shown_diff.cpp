@@ -24,12 +24,19 @@ std::string for_output(const std::string &diff) {
     return shown;
 }
 
+/* A name as patch(1) reads it: in quotes, if there are line breaks or tabs in it. */
+std::string patch_name(const std::string &name) {
+    return name.find_first_of("\n\r\t") == name.npos ? name : text::quoted(name);
+}
+
 } // namespace
 
 std::string shown_diff(const std::string &source, std::string_view before, std::string_view after) {
     std::string name = source == "-" ? "stdin" : source;
     bool absolute = name.starts_with('/');
-    return for_output(text::unified_diff((absolute ? "" : "a/") + name, (absolute ? "" : "b/") + name, before, after));
+    std::string old_name = patch_name((absolute ? "" : "a/") + name);
+    std::string new_name = patch_name((absolute ? "" : "b/") + name);
+    return for_output(text::unified_diff(old_name, new_name, before, after));
 }
 
 } // namespace cdef

@@ -88,6 +88,16 @@ def test_diff(source):
     same(cdef("--diff", "x.cdefsrc", cwd=source.parent), (0, b"", ""), "result")
 
 
+def test_diff_of_a_source_with_an_odd_name(source):
+    """The name is quoted, as patch reads it."""
+    odd = source.rename(source.with_name("a\tb\nc.cdefsrc"))
+    status, diff, errors = cdef("--diff", odd.name, cwd=odd.parent)
+    same((status, errors), (1, ""), "result")
+    assert diff.startswith(b'--- "a/a\\tb\\nc.cdefsrc"\n+++ "b/a\\tb\\nc.cdefsrc"\n@@ ')
+    subprocess.run(["patch", "-s", "-p1"], cwd=odd.parent, input=diff, check=True)
+    same(odd.read_bytes(), FORMATTED, "source")
+
+
 def test_reorder(source):
     """Attributes are in their usual order."""
     same(cdef("--reorder", "x.cdefsrc", cwd=source.parent), (0, REORDERED, ""), "result")

@@ -38,6 +38,13 @@ class Trial(Case):
     def made(self, name):
         return (self.here / "b" / name).read_bytes()
 
+    def newest(self, name):
+        """Makes a file that CMake reads newer than what has been built. It must not be newer than now: Ninja would run
+        CMake again and again, and give up after a hundred times."""
+        built = max(path.lstat().st_mtime_ns for path in (self.here / "b").rglob("*"))
+        while (self.here / name).stat().st_mtime_ns <= built:
+            os.utime(self.here / name)
+
     def leftovers(self):
         return [str(path) for path in (self.here / "b").rglob(".*cdef-new")]
 
@@ -212,7 +219,7 @@ class Compile:
         self.project("cdgen_compile(disk a.cdefsrc a.cdef)", a=odd)
         self.assertIn("S509", self.build())
         (self.here / "cdef.toml").write_text("[warnings]\nwerror = true\n")
-        later(self.here / "cdef.toml")
+        self.newest("cdef.toml")
         with self.assertRaises(AssertionError) as failed:
             self.build()
         self.assertIn("S509", str(failed.exception))
@@ -256,7 +263,7 @@ class Compile:
         self.assertEqual(self.order_of("one.cdef"), BIG)
         self.assertNotIn("Building class definition", self.build())
         (self.here / "cdef.toml").write_text("[build]\nbyte-order = 'little'\n")
-        later(self.here / "cdef.toml")
+        self.newest("cdef.toml")
         self.build()
         self.assertEqual(self.order_of("a.cdef"), LITTLE)
 
@@ -267,7 +274,7 @@ class Compile:
             self.build()
         self.assertIn(f"{self.here}/cdef.toml:2:1: unknown key of [build]: `byte-oder`", str(failed.exception))
         (self.here / "cdef.toml").write_text("[build]\nbyte-order = 'both'\n")
-        later(self.here / "cdef.toml")
+        self.newest("cdef.toml")
         self.build()
         self.assertEqual(self.order_of("a.be.cdef"), BIG)
 

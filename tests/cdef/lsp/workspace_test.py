@@ -5,8 +5,8 @@ import shutil
 
 import pytest
 
-from features_test import PUMP
 from lsp_client import CAPABILITIES, Client, ServerError, edited, part, uri_of
+from lsp_pump import PUMP
 from programs import EXAMPLES
 
 ABLE = {**CAPABILITIES, "window": {"workDoneProgress": True},

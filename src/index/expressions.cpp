@@ -2,6 +2,8 @@
 
 #include "index/expressions.h"
 
+#include "language/expressions.h"
+
 #include <algorithm>
 #include <cctype>
 
@@ -19,13 +21,6 @@ bool is_digit(char c) {
     return c >= '0' && c <= '9';
 }
 
-/* The end of the quoted text that begins here, after its closing quote; npos if it has none. A quote after a backslash
- * counts, as in all of a source. */
-std::size_t end_of_quoted(std::string_view text, std::size_t open) {
-    std::size_t close = text.find(text[open], open + 1);
-    return close == std::string_view::npos ? close : close + 1;
-}
-
 std::size_t end_of_word(std::string_view text, std::size_t begin) {
     return static_cast<std::size_t>(
         std::find_if_not(text.begin() + static_cast<std::ptrdiff_t>(begin), text.end(), is_letter) - text.begin());
@@ -38,8 +33,8 @@ std::vector<expression_name> names_in(std::string_view expression) {
     std::size_t member_at = std::string_view::npos; /* a word that begins here is an element of the name before it */
     for (std::size_t at = 0; at < expression.size();) {
         char c = expression[at];
-        if (c == '"' || c == '\'') {
-            at = end_of_quoted(expression, at);
+        if (language::is_quote(c)) {
+            at = language::end_of_quoted(expression, at);
         } else if (is_letter(c)) {
             std::size_t end = end_of_word(expression, at);
             if (!is_digit(c))
@@ -56,12 +51,11 @@ std::vector<expression_name> names_in(std::string_view expression) {
 
 bool is_in_quotes(std::string_view expression, std::size_t offset) {
     for (std::size_t at = 0; at < std::min(offset, expression.size());) {
-        char c = expression[at];
-        if (c != '"' && c != '\'') {
+        if (!language::is_quote(expression[at])) {
             ++at;
             continue;
         }
-        std::size_t end = end_of_quoted(expression, at);
+        std::size_t end = language::end_of_quoted(expression, at);
         if (offset < end)
             return true;
         at = end;

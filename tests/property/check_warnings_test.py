@@ -239,16 +239,18 @@ def is_balanced(text):
     """Whether all parentheses and quotes come in pairs."""
     depth, quote, escaped = 0, "", False
     for letter in text:
-        if escaped or letter == "\\":
-            escaped = not escaped
-        elif quote:
+        if quote:
             quote = "" if letter == quote else quote
+        elif letter not in "\"'" and (escaped or letter == "\\"):
+            escaped = not escaped
+            continue
         elif letter in "\"'":
             quote = letter
         elif letter in "()":
             depth += 1 if letter == "(" else -1
             if depth < 0:
                 return False
+        escaped = False
     return depth == 0 and not quote
 
 

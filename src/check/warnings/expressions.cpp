@@ -1,6 +1,7 @@
 /* expressions.cpp: a warning about incomplete expressions. The runtime defines their grammar; this only checks that
  * parentheses and quotes come in pairs. */
 
+#include "language/expressions.h"
 #include "check/warnings/watcher.h"
 
 #include <cstddef>
@@ -19,29 +20,27 @@ struct lone_character {
     char character;
 };
 
-/* The first closing character without an opening one, or else the last opening one without a closing one. A character
- * after a backslash does not count, and parentheses in quotes do not. */
+/* The first closing character without an opening one, or else the last opening one without a closing one. Parentheses
+ * in quotes or after a backslash do not count. */
 std::optional<lone_character> lone_in(std::string_view text) {
     std::vector<size_t> open; /* parentheses */
-    size_t quote = std::string_view::npos;
     for (size_t at = 0; at < text.size(); ++at) {
         char c = text[at];
-        bool quoted = quote != std::string_view::npos;
-        if (c == '\\')
+        if (language::is_quote(c)) {
+            size_t end = language::end_of_quoted(text, at);
+            if (end == std::string_view::npos)
+                return lone_character{at, c};
+            at = end - 1;
+        } else if (c == '\\' && at + 1 < text.size() && !language::is_quote(text[at + 1])) {
             ++at;
-        else if (quoted && c == text[quote])
-            quote = std::string_view::npos;
-        else if (!quoted && (c == '"' || c == '\''))
-            quote = at;
-        else if (!quoted && c == '(')
+        } else if (c == '(') {
             open.push_back(at);
-        else if (!quoted && c == ')' && open.empty())
+        } else if (c == ')' && open.empty()) {
             return lone_character{at, c};
-        else if (!quoted && c == ')')
+        } else if (c == ')') {
             open.pop_back();
+        }
     }
-    if (quote != std::string_view::npos)
-        return lone_character{quote, text[quote]};
     if (!open.empty())
         return lone_character{open.back(), '('};
     return std::nullopt;

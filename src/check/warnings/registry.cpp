@@ -181,8 +181,8 @@ constexpr row rows[] = {
       "Remove it. Quote a value that has to begin with a blank."},
      make_outer_blank},
     {{UNBALANCED, "S537", "unbalanced", "an expression lacks a parenthesis or a quote",
-      "An `Expression` or `ReArmExpression` has a parenthesis or a quote without its partner. Characters after a "
-      "backslash do not count.",
+      "An `Expression` or `ReArmExpression` has a parenthesis or a quote without its partner. After a backslash, a "
+      "quote counts, a parenthesis does not.",
       "Add the missing character, or remove this one."},
      make_unbalanced},
     {{INCOMPLETE, "S515", "incomplete", "a stanza lacks required attributes",

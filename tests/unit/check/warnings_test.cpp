@@ -171,7 +171,8 @@ TEST(Unbalanced, IsReportedAtTheLoneCharacter) {
     EXPECT_EQ(of("A == \"b"), codes{"S537 24:18+1"});
     EXPECT_EQ(of("A == 'it"), codes{"S537 24:18+1"});
     EXPECT_EQ(of("(A == \"it's (\") && A != ')'"), codes());
-    EXPECT_EQ(of("A == \\\""), codes());
+    EXPECT_EQ(of("A == 'it\\'s'"), codes{"S537 24:24+1"}); /* a quote after a backslash counts */
+    EXPECT_EQ(of("A == 'it\\' && (B)"), codes());
 }
 
 TEST(ClassBit, IsReportedInAVariableClassOnly) {

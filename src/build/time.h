@@ -22,7 +22,7 @@ struct time_wishes {
     bool forced_empty = false;                   /* VX_CDB_FORCE_EMPTY_TIMESTAMP exists; overrides everything */
 };
 
-/* The time to be written; 0 is none. Throws wrong_request, also for an option that has no effect. */
+/* The time to write into a database; 0 stands for none. Throws wrong_request, also if the option has no effect. */
 orb_timeval32_t time_of(const time_wishes &wishes, orb_timeval32_t now);
 
 } // namespace build

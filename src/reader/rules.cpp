@@ -39,7 +39,8 @@ constexpr rule all_rules[] = {
     {"CDB204", error, "unknown section type", "An anchor has a type that no section has.", REBUILD},
     {"CDB205", warning, "section of an unused type",
      "An anchor has one of the types 0, 1 and 2, which the compiler never writes. The contents are not checked.",
-     CHECK_SOURCE},
+     "None, if another program adds such sections. Otherwise compile the source again, or take another copy of the "
+     "file."},
     {"CDB206", error, "wrong section length",
      "A section is too short for its record, or its length is not the sum of its counts and strings.", REBUILD},
     {"CDB207", error, "section out of order",

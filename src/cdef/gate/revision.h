@@ -8,8 +8,8 @@
 
 namespace cdef::gate_command {
 
-/* The files at a revision of the repository that contains a directory. A file that does not exist is told apart from
- * one that git cannot read: all functions throw failure for the latter. */
+/* The files at a revision of the repository that contains a directory. All functions throw failure
+ * for a file that exists but that git cannot read. */
 class revision {
 public:
     /* about: what the revision is needed for, which a failure names. HEAD has no files before the first commit. Throws

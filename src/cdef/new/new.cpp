@@ -45,7 +45,7 @@ void make_file(const std::string &path, const std::string &text) {
 
 std::string file_for(const std::string &name) {
     if (name.find('/') != std::string::npos || name.starts_with('.') || name.starts_with('-'))
-        throw failure(name + ": a file cannot be called after this name: choose a file with -o");
+        throw failure(name + ": no file can have this name: choose another one with -o");
     return name + ".cdefsrc";
 }
 

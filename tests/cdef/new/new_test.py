@@ -25,7 +25,7 @@ def test_calls_the_source_after_the_class(world):
     check(b"\tName=Fan\n" in world.read("Fan.cdefsrc"), world.read("Fan.cdefsrc"))
     for name in ("a/Fan", "../Fan", ".Fan", "-x"):
         result = world.inspect("new", "class", "--", name)
-        expect(result, 2, b"cdef: %s: a file cannot be called after this name: choose a file with -o\n" % name.encode())
+        expect(result, 2, b"cdef: %s: no file can have this name: choose another one with -o\n" % name.encode())
 
 
 def test_writes_to_standard_output(world):

@@ -4,6 +4,7 @@
 
 #include "format/names.h"
 #include "index/expressions.h"
+#include "language/expressions.h"
 #include "language/names.h"
 #include "server/documentation.h"
 #include "server/examples.h"
@@ -356,7 +357,8 @@ void add_word(items &to, const place_in_source &place, std::size_t name) {
 void add_expression_names(items &to, const place_in_source &place, const stretch &word) {
     const source_index::names &names = place.in.names();
     const stretch &value = place.attribute->parts.value;
-    if (source_index::is_in_quotes(value.of(place.text()), place.offset - value.begin))
+    bool after_quote = word.begin > value.begin && language::is_quote(place.text()[word.begin - 1]);
+    if (after_quote || source_index::is_in_quotes(value.of(place.text()), place.offset - value.begin))
         return;
     auto scope = static_cast<std::size_t>(place.stanza->class_number);
     bool member = word.begin > 0 && place.text()[word.begin - 1] == '.';
@@ -482,6 +484,12 @@ json value_items(const session &now, const place_in_source &place) {
     return found.take();
 }
 
+/* Whether a line is indented and has text, so that no header can be put in front of it. */
+bool is_indented(std::string_view line) {
+    std::size_t text = line.find_first_not_of(" \t");
+    return text != line.npos && text > 0;
+}
+
 /* The end of the header or the attribute's name in which the place is; otherwise the place. */
 std::size_t end_of_word(const place_in_source &place) {
     stretch word = is_header(place) ? place.stanza->header : stretch{place.offset, place.offset};
@@ -512,7 +520,8 @@ json completion(session &now, const json &params) {
         return value_items(now, place);
     stretch part = {word, end_of_word(place)};
     bool before_name = place.attribute != nullptr && place.offset < place.attribute->parts.name.begin;
-    if (is_in_two_lines(place, part))
+    bool before_text = place.offset == begin && is_indented(source.substr(begin, source.find('\n', begin) - begin));
+    if (before_text || is_in_two_lines(place, part))
         return json::array();
     items found(now, place, part);
     if (word == begin)

@@ -177,6 +177,10 @@ def test_no_stanza_is_offered_on_a_line_with_a_text(pump, words):
     assert at(pump, "textDocument/completion", place(PUMP, words)) == []
 
 
+def test_no_stanza_is_offered_before_a_line_that_has_none(pump):
+    assert complete(pump, "|\tName=x\n")[0] == []
+
+
 @pytest.mark.parametrize("line", ["  |  Locator=Host", "\t|# x", "|  # x", "\tLocator=Ho\rs|t", "\tLo\rc|ator=Host",
                                   "\tLocator=Host |# x", "\tLocator=Host  | // x", '\tLocator="Host"|', '\tLocator=|"Host"',
                                   '\tLocator="Host" |', "\tLocator= | /* x"])
@@ -198,7 +202,7 @@ def test_an_item_leaves_the_rest_of_its_line(pump, line, label, after):
 
 @pytest.mark.parametrize("line", ["\tExpression=\"Speed > 9\"|", "\tExpression=|\"Speed > 9\"",
                                   "\tExpression=\"Speed > 9\"  |", "\tExpression=Speed > 9 |# x",
-                                  '\tExpression="Host == \\"Sp|eed\\""'])
+                                  '\tExpression="Host == \\"Sp|eed\\""', "\tExpression=(Host == 'x'|) || Speed > 9"])
 def test_names_are_offered_only_within_an_expression(pump, line):
     """And outside of its quotes: one after a backslash is a quote like any other."""
     assert complete(pump, PUMP.replace('\tExpression="Speed.Turns > 9 && Speed.Turns < 99"', line))[0] == []

@@ -190,7 +190,8 @@ std::optional<fact> fact_in(const node &n, std::size_t field_index) {
         return fact{&what, number_in(n, f)};
     if (is_reference && f.to == cdb::target::strings)
         return fact{&what, text_in(n, f)};
-    if (f.kind == cdb::field_kind::value && f.type_at != cdb::TYPE_OF_OWNER)
+    bool is_value = f.kind == cdb::field_kind::value && f.type_at != cdb::TYPE_OF_OWNER;
+    if (is_value && n.section != nullptr)
         return fact{&what,
                     value_in(n.area, n.at + f.offset, data_type_of(n), n.section->tables.strings, n.from->owners)};
     return std::nullopt;

@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <fcntl.h>
 #include <memory>
+#include <new>
 #include <optional>
 #include <unistd.h>
 #include <utility>
@@ -26,7 +27,8 @@ struct source_check {
           warned(wanted, found) {}
 
     totals run();
-    void take(const source_line &source);
+    void take(source_line &source);
+    void take_returns(source_line &source);
     void hand_over(finding &&each);
     bool is_open(warning_id id, int at_line) const;
     void finish();
@@ -44,15 +46,20 @@ struct source_check {
     recovery recover = {compiler, line, known, found, see, warned};
 };
 
-void source_check::take(const source_line &source) {
-    line.read(source, compiler.line_number());
+/* Notes how to remove the carriage returns at the end of the line, and removes the last one if they are ignored. */
+void source_check::take_returns(source_line &source) {
     if (std::optional<edit> removal = line.without_returns(); removal && returns.size() < RETURNS_MAX)
         returns.push_back(std::move(*removal));
-    warned.line(see);
-    source_line stripped = source;
     if (recover.strips_returns() && line.raw.ends_with('\r'))
-        --stripped.end;
-    line.text = text_of(stripped);
+        --source.end;
+}
+
+void source_check::take(source_line &source) {
+    line.read(source, compiler.line_number());
+    if (line.carriage_return() < line.raw.size())
+        take_returns(source);
+    warned.line(see);
+    new (&line.text) attr_text(text_of(source)); /* in place: a copy would wait for what has just been written */
     if (line.text.end == nullptr)
         return;
     if (line.text.name == line.text.line)

@@ -59,8 +59,8 @@ public:
 private:
     static constexpr const char *CLASS_NAME = "class.cdef";
 
-    void attribute_read(const attr_place &read) override {
-        attribute = read;
+    void attribute_read(const table_attrs &attr, std::string_view value) override {
+        attribute = {&attr, value.data(), value.size()};
     }
     bool excuses_missing(int kind) const override {
         return is_broken(kind);

@@ -22,7 +22,7 @@ bool is_within(const char *p, const char *begin, const char *end) {
 void current_line::read(const source_line &source, int line_number) {
     characters_before = fills_piece ? characters_before + text::characters_in(raw) : 0;
     size_t length = std::min(static_cast<size_t>(source.end - source.begin), read_bytes.size());
-    memcpy(read_bytes.data(), source.begin, length);
+    memmove(read_bytes.data(), source.begin, length); /* GCC makes a slow loop of memcpy */
     raw = {read_bytes.data(), length};
     find_return(source);
     number = line_number;

@@ -40,24 +40,26 @@ void recovery::take_attribute() {
         compiler.take_attribute(line.text);
     } catch (const fatal_exit &failure) {
         recover_attribute(failure);
-        return settle_order();
+        if (early.is_open())
+            settle_order();
+        return;
     }
     if (compiler.conversion_errno() != errno_before)
         known.overflow_line = line.number;
     if (compiler.latest().attr == nullptr)
         return;
     note_given();
-    settle_split();
+    if (known.split.kind != NO_KIND)
+        settle_split();
     if (!known.stanza().misplaced)
         note_value();
     warned.attribute(see);
-    settle_order();
+    if (early.is_open())
+        settle_order();
 }
 
 /* Optional attributes that came too early are moved after the last required one. A line in pieces is not moved. */
 void recovery::settle_order() {
-    if (!early.is_open())
-        return;
     if (compiler.is_complete(known.kind)) {
         if (finding *error = found.waiting_error(MSG_OPTIONAL_TOO_EARLY, early.first_line()))
             error->fix = early.after(line);
@@ -73,7 +75,7 @@ void recovery::settle_order() {
 /* An attribute that the incomplete stanza before this one already has, or cannot have, is not one of its missing lines.
  */
 void recovery::settle_split() {
-    if (known.split.kind == NO_KIND || see.attr().dup_allowed != 0)
+    if (see.attr().dup_allowed != 0)
         return;
     const srtable_ctrl &table = table_of(known.split.kind);
     const table_attrs *attr = find_attr(table, see.attr().ta_name);

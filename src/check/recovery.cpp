@@ -171,14 +171,13 @@ void recovery::note_given() {
     const attr_place &latest = compiler.latest();
     if (latest.attr == nullptr)
         return;
-    auto at = static_cast<size_t>(latest.attr - table_of(known.kind).sc_attrs.data());
-    int &given = known.stanza().given[at];
-    if (given == 0 && known.kind == SC_RESOURCE_VARIABLE_CLASS &&
-        std::string_view(latest.attr->ta_name) == "VariableClass")
-        known.variable_class_names.push_back(see.value_mention());
+    stanza_record &stanza = known.stanza();
+    int &given = stanza.given[static_cast<size_t>(latest.attr - table_of(known.kind).sc_attrs.data())];
     if (given == 0) {
         given = line.number;
-        known.stanza().suspect = false;
+        stanza.suspect = false;
+        if (known.kind == SC_RESOURCE_VARIABLE_CLASS && std::string_view(latest.attr->ta_name) == "VariableClass")
+            known.variable_class_names.push_back(see.value_mention());
     }
     if (known.kind == SC_CLASS_TO_MANAGER_MAPPING)
         known.map_values.push_back({see.value_place(), latest.attr->ta_name, std::string(line.raw)});

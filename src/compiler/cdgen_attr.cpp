@@ -87,7 +87,7 @@ void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, s
         return;
     const table_attrs &attr = expected != nullptr ? *expected : known_attr(cx, scp, state, name);
     if (cx.options.observer != nullptr)
-        cx.options.observer->attribute_read({&attr, value, length});
+        cx.options.observer->attribute_read(attr, {value, length});
     if (*value == '\0') {
         if (cx.options.explanations != nullptr)
             fprintf(cx.options.explanations, "In file %s: ", cx.options.cdefsrc);

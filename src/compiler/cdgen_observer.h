@@ -3,6 +3,7 @@
 #define CDGEN_CDGEN_OBSERVER_H
 
 #include <cstddef>
+#include <string_view>
 
 struct table_attrs;
 
@@ -16,7 +17,7 @@ struct attr_place {
 class line_observer {
 public:
     /* Called for an attribute line with a known name and a value that is not too long. */
-    virtual void attribute_read(const attr_place &read) = 0;
+    virtual void attribute_read(const table_attrs &attr, std::string_view value) = 0;
     /* Whether an optional attribute of the kind's current stanza may come before a required one. kind: a stanza_id */
     virtual bool excuses_missing(int kind) const = 0;
 

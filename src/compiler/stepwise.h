@@ -7,7 +7,7 @@
 
 /* For callers that only want the compilation. */
 struct no_observer final : line_observer {
-    void attribute_read(const attr_place &) override {}
+    void attribute_read(const table_attrs &, std::string_view) override {}
     bool excuses_missing(int) const override {
         return false;
     }

@@ -13,9 +13,9 @@
 namespace {
 
 struct looking_on final : line_observer {
-    void attribute_read(const attr_place &read) override {
-        names.emplace_back(read.attr->ta_name);
-        values.emplace_back(read.value, read.length);
+    void attribute_read(const table_attrs &attr, std::string_view value) override {
+        names.emplace_back(attr.ta_name);
+        values.emplace_back(value);
     }
     bool excuses_missing(int) const override {
         return excuses;

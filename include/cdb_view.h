@@ -202,8 +202,8 @@ std::vector<std::byte> read_file(const char *path, std::error_code &error);
 /* ---- Soundness ------------------------------------------------------------------------------------------------- */
 
 /**
- * How bad a finding is. An error would make reading unsafe, endless or ambiguous. A warning is about something that the
- * compiler itself can make from a careless source.
+ * How bad a finding is. An error would make reading unsafe, endless or ambiguous. A warning is about something that
+ * does not; all but CDB205 are about what the compiler itself can make from a careless source.
  */
 enum class severity : std::uint8_t { warning, error };
 

@@ -45,7 +45,7 @@ constexpr message table[] = {
      FIRST, mark_kind::name, blame::source,
      "An optional attribute comes before a required one, or a required one is missing. "
      "`ActionOutSDDefinition` accepts no optional attributes.",
-     "Move it after the required attributes, which the note names."},
+     "Put it after all required attributes, which the note names. In `ActionOutSDDefinition`, remove it."},
     {MSG_REPEATED_ATTRIBUTE, "S109", "Already defined. Duplicated definitions not allowed for ", FIRST, mark_kind::name,
      blame::source, "An attribute that may be given once is given again.", "Remove one of the two."},
     {MSG_NO_SD_ATTRIBUTE, "S110", "Incorrect attribute type preceding this SD definition", FIRST, mark_kind::text,

@@ -177,7 +177,7 @@ void add_options(command &to, build_options &options) {
     to.add("--byte-order", options.order, "native, little, big or both (NAME.le.cdef and NAME.be.cdef)")
         .one_of(names_of_orders());
     to.add("--timestamp", options.timestamp,
-           "Time in the database: none, now or SECONDS since 1970; SOURCE_DATE_EPOCH if it is set");
+           "Time in the database: none, now or SECONDS since 1970; by default SOURCE_DATE_EPOCH, else none");
     to.add("--depfile", options.depfile, "Write the dependencies of the databases to FILE, for Make or Ninja");
     to.add_number("-j,--jobs", options.jobs, build_command::MOST_JOBS, "Compile this many sources at once");
     to.add_flag("--sync", options.sync, "Wait until each database is on the disk before it replaces the old one");

@@ -52,7 +52,7 @@ std::string file_for(const std::string &name) {
 int write_first_source(const new_options &options) {
     std::optional<std::string> source = new_command::first_source(options.name);
     if (!source)
-        throw failure(options.name + ": a source cannot give a class this name");
+        throw failure(options.name + ": no source can give a class this name");
     std::string path = options.file ? *options.file : file_for(options.name);
     if (path == "-") {
         print(*source);

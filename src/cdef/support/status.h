@@ -22,9 +22,11 @@ struct meanings {
 /* FAILED also means a wrong command line, or output that cannot be written. */
 inline constexpr std::array<meanings, 11> statuses = {{
     {"verify", "no errors", "errors, or warnings with --werror", "a file cannot be read, or is a text file"},
-    {"dump", "the database is shown", "", "the file cannot be read or, without --hex, is not a sound database"},
+    {"dump", "the database is shown", "",
+     "the file cannot be read or, without --hex, has errors other than a wrong checksum or reserved bytes"},
     {"diff", "no difference (with --compat: B can take the place of A)", "differences (with --compat: it cannot)",
-     "a database cannot be read or is not sound, or the output would be too large"},
+     "a database cannot be read or has errors other than a wrong checksum or reserved bytes, or the output would be "
+     "too large"},
     {"source", "the source is written", "", "the database cannot be read, or no source reproduces it"},
     {"check", "no errors", "errors, or warnings with --werror", "a source cannot be read, or is a database"},
     {"format", "done (with --check or --diff: nothing would change)", "with --check or --diff: a source would change",
@@ -35,10 +37,10 @@ inline constexpr std::array<meanings, 11> statuses = {{
     {"gate", "nothing breaks", "something breaks, a source has errors, or with --werror there are warnings",
      "a file or an older version cannot be read"},
     {"new", "the source is written", "",
-     "the source exists or cannot be written, or a source cannot give a class this name"},
+     "the source exists or cannot be written, or no source can give a class this name"},
     {"explain", "the codes are explained", "", "there is no such code"},
     {"lsp", "the client has sent shutdown and then exit",
-     "the client has sent exit without shutdown, the client or its input has ended, or the header of a message is "
+     "the client has sent exit without shutdown, the client or standard input has ended, or the header of a message is "
      "wrong",
      "standard input cannot be read"},
 }};

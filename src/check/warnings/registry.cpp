@@ -49,7 +49,7 @@ constexpr row rows[] = {
     {{TEXT_AFTER_QUOTE, "S520", "text-after-quote", "text follows the quote that seems to end a value",
       "A value in quotes contains another quote that has no partner, with text after it.",
       "Remove the quote if it is not part of the value. If the value itself begins and ends with a quote, put another "
-      "pair of quotes around it: `\"\"a\" == \"b\"\"`. Around any other value that contains quotes, put none. A "
+      "pair of quotes around it: `\"\"a\" == \"b\"\"`. Put no quotes around any other value that contains quotes. A "
       "backslash in front of a quote is stored too."},
      make_text_after_quote},
     {{NUMBER_TEXT, "S510", "number-text", "a number is followed by text, or there is none",
@@ -91,7 +91,8 @@ constexpr row rows[] = {
       "A `Range` of a `DynamicClassAttribute` is stored in a `DynamicResourceAttribute` that is still "
       "open. Or another dynamic attribute is completed between the `Range` and the end of its own attribute. Then the "
       "`Range` may be lost, and the other attribute, if it has no `Range`, gets the range 0 to 0 instead of 0 to 100.",
-      "Put dynamic class attributes before dynamic resource attributes, and let the last of them have no `Range`. "
+      "Put dynamic class attributes before dynamic resource attributes, and give the last dynamic class attribute no "
+      "`Range`. "
       "After an attribute with a `Range`, put another of its kind."},
      make_range_elsewhere},
     {{UNUSED_DEFAULT, "S511", "unused-default", "a DefaultValue is never used",
@@ -246,7 +247,8 @@ constexpr row rows[] = {
     {{RULE_NAME, "S615", "rule-name", "a build system misreads the name of a file",
       "The file of `--depfile` contains a name that Make or Ninja misreads. Ninja then builds the database "
       "every time, and Make does not notice a change of the source. Only `cdef build` reports this.",
-      "Rename the file or its directory. If only the other program reads the file, turn the warning off."},
+      "Rename the file or its directory. If only a program that reads the name correctly uses the file, turn the "
+      "warning off."},
      make_nothing},
 };
 

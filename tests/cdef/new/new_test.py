@@ -57,7 +57,7 @@ def test_leaves_no_part_of_a_source(world):
 def test_refuses_names_that_no_source_gives(world, name):
     """Nothing is written."""
     result = world.inspect("new", "class", "-o", "x.cdefsrc", name)
-    check(result.returncode == 2 and result.stderr.endswith(b": a source cannot give a class this name\n"), result)
+    check(result.returncode == 2 and result.stderr.endswith(b": no source can give a class this name\n"), result)
     check(not world.path("x.cdefsrc").exists(), "written")
 
 

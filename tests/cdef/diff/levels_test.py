@@ -1,7 +1,5 @@
 """Test what cdef diff --compat finds at each level: each rule has a pair of sources that breaks it, and a similar pair
 that does not. Both change base.cdefsrc. The rules are those of the table in docs/diff.md.
-
-Both change base.cdefsrc.  The rules are those of the table in docs/diff.md.
 """
 
 import json
@@ -49,6 +47,23 @@ def test_rule(programs, code, breaking, line, similar):  # noqa: F811
     same((status, code in codes_of(text)), (1, False), "similar")
     for lower in LEVELS[: LEVELS.index(level)]:
         same(code in codes_of(compared(programs, breaking, "--json", f"--compat={lower}")[1]), False, lower)
+
+
+PERSISTENT = "\tDataType=Int32\n\tVarietyRange=1,1\n"
+DYNAMIC = "\tDataType=Int32\n\tVarietyRange=1,1\n\tVariableType=State\n"
+ACTION = "\tVarietyRange=1,1\n"
+
+
+@pytest.mark.parametrize("kind,more", [
+    ("PersistentResourceAttribute", PERSISTENT), ("PersistentClassAttribute", PERSISTENT),
+    ("DynamicResourceAttribute", DYNAMIC), ("DynamicClassAttribute", DYNAMIC), ("ResourceAction", ACTION), ("ClassAction", ACTION),
+])
+def test_readers_miss_what_is_gone(programs, kind, more):  # noqa: F811
+    stanza = f"{kind}\n\tName=Gone\n\tDescription=1\n\tDisplayName=2\n\tId=700\n{more}"
+    one = programs.compile(replaced(base(), "ClassToManagerMapping\n", stanza + "ClassToManagerMapping\n"), "one.cdef")
+    two = programs.compile(base(), "two.cdef")
+    status, text, _ = programs.diff("--compat=readers", one, two)
+    same((status, [line for line in text.splitlines() if "Gone" in line] != []), (1, True), text)
 
 
 def test_every_rule_has_its_pairs():

@@ -29,6 +29,15 @@ TEST(FirstLines, HasWhatWasAskedFor) {
     EXPECT_FALSE(lines.has("aa"));
 }
 
+TEST(FirstLines, DistinguishesNumbersWithTheSameHash) {
+    check::first_lines lines;
+    lines.line_of(1176u) = 1;
+    EXPECT_EQ(lines.find(26580224u), 0);
+    lines.line_of(26580224u) = 2;
+    EXPECT_EQ(lines.find(1176u), 1);
+    EXPECT_EQ(lines.find(26580224u), 2);
+}
+
 TEST(FirstLines, HoldsManyTextsAndNumbers) {
     check::first_lines texts, numbers;
     for (int i = 1; i <= 10000; ++i)

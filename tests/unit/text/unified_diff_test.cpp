@@ -40,6 +40,16 @@ TEST(UnifiedDiff, SaysWhereANewlineIsMissing) {
     EXPECT_EQ(diff("1\n2", "1\n2\n"), "--- a\n+++ b\n@@ -1,2 +1,2 @@\n 1\n-2\n\\ No newline at end of file\n+2\n");
 }
 
+TEST(UnifiedDiff, FindsALineThatIs64LinesAway) {
+    std::string removed;
+    std::string shown;
+    for (int i = 0; i < 64; ++i) {
+        removed += std::to_string(i) + "\n";
+        shown += "-" + std::to_string(i) + "\n";
+    }
+    EXPECT_EQ(diff(removed + "same\n", "same\n"), "--- a\n+++ b\n@@ -1,65 +1 @@\n" + shown + " same\n");
+}
+
 TEST(UnifiedDiff, TakesManyChangedLines) {
     std::string before;
     std::string after;

@@ -4,7 +4,7 @@
 set(large_group 4) # the next folder begins another group
 set(largest_group 7)
 
-# Sources that would not compile after their neighbours, because both name something of their own alike.
+# Sources that would not compile after their neighbours, because both use the same name for something of their own.
 set(compiled_alone
   src/cdef/gate/git.cpp
   src/cdef/source/bounds.cpp

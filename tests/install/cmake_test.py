@@ -39,8 +39,8 @@ class Trial(Case):
         return (self.here / "b" / name).read_bytes()
 
     def newest(self, name):
-        """Makes a file that CMake reads newer than what has been built. It must not be newer than now: Ninja would run
-        CMake again and again, and give up after a hundred times."""
+        """Gives a file of the project a later time than all that has been built has. It must not be later than now: Ninja
+        would run CMake again and again, and give up after a hundred times."""
         built = max(path.lstat().st_mtime_ns for path in (self.here / "b").rglob("*"))
         while (self.here / name).stat().st_mtime_ns <= built:
             os.utime(self.here / name)

@@ -102,26 +102,25 @@ public:
         size_t size = used_bytes(t);
         if (size == 0)
             return 0;
-        if (t->tbl_owner == memory_owner::RESERVED)
-            for (; t->used() > RESERVE_FROM; t->release_front(RESERVE_FROM))
-                write(t->tbl_base, RESERVE_FROM);
-        write(t->tbl_base, t->used());
+        for (const char *next = t->tbl_base; next < t->tbl_next; next += PIECE) {
+            t->release_before(next);
+            write(next, std::min(static_cast<size_t>(t->tbl_next - next), PIECE));
+        }
         t->release();
         return size;
+    }
+
+    /* The same, and zeros up to a multiple of 8; returns the rounded size. */
+    vx_uint32_t move_rounded(tbl_content *t) {
+        size_t size = move_table(t);
+        round_up(size);
+        return static_cast<vx_uint32_t>(round8(size));
     }
 
     /* Writes zeros up to the next multiple of 8 after this many bytes. */
     void round_up(size_t size) {
         constexpr char zeros[8] = {};
         write(zeros, round8(size) - size);
-    }
-
-    /* Writes the bytes of a staged table and zeros up to a multiple of 8; returns the rounded size. */
-    vx_uint32_t write_rounded(const tbl_content *t) {
-        size_t size = used_bytes(t);
-        write(size > 0 ? t->tbl_base : nullptr, size);
-        round_up(size);
-        return static_cast<vx_uint32_t>(round8(size));
     }
 
     void finish() {
@@ -172,6 +171,8 @@ void add_class(cdgen &cx, const rsrc_class_t &staged) {
     store(at, record);
     note_nowhere(cx, record, at);
     out.finish();
+    for (const cdb::side_table &table : cdb::side_tables_as_made)
+        give_back_filed_before(cx.store.of_classes, staged.*table.ref);
 }
 
 /* The name is the first string of the table that follows, so the reference to it is 0, and so is the reference to the
@@ -182,7 +183,7 @@ void add_mgr(cdgen &cx, const rsrc_mgr_t &staged) {
     record.u_rm_RMname = {};
     record.u_rm_strings_table = {};
     out.write(&record, sizeof record);
-    out.write_rounded(staged_content(staged.u_rm_strings_table));
+    out.move_rounded(staged_content(staged.u_rm_strings_table));
     out.finish();
 }
 
@@ -191,7 +192,7 @@ void add_cmmap(cdgen &cx, const rsrc_cmmap_t &staged) {
     rsrc_cmmap_t record = staged;
     record.u_rcm_strings = {{sizeof record, 0}};
     out.write(&record, sizeof record);
-    out.write_rounded(staged_content(staged.u_rcm_strings));
+    out.move_rounded(staged_content(staged.u_rcm_strings));
     out.finish();
 }
 
@@ -200,18 +201,26 @@ void add_var_class(cdgen &cx, const rsrc_variable_class_t &staged) {
     section out(cx, CDB_DSECT_VAR_CLASS);
     char *at = out.write(&staged, sizeof staged);
     rsrc_variable_class_t record = staged;
-    record.u_rvc_string_tbl = {{out.write_rounded(staged_content(staged.u_rvc_string_tbl)), 0}};
-    out.write_rounded(find_tbl_entry(cx, &staged));
+    record.u_rvc_string_tbl = {{out.move_rounded(staged_content(staged.u_rvc_string_tbl)), 0}};
+    out.move_rounded(find_tbl_entry(cx, &staged));
     store(at, record);
     out.finish();
+    give_back_filed_before(cx.store.of_variable_classes, staged.u_rvc_string_tbl);
 }
 
-/* Adds a section for each record of a staged table. */
-template <class Record, class Add> void add_all(cdgen &cx, tbl *t, message_id missing, Add add) {
-    if (t->tbl_base == nullptr)
+void require_table(const tbl &t, message_id missing) {
+    if (t.tbl_base == nullptr)
         bld_error_exit(missing, nullptr, nullptr, 1);
-    for (const Record &record : records_of<Record>(t))
+}
+
+/* Adds a section for each record of a staged table, which is freed meanwhile, as the side tables of the records are. */
+template <class Record, class Add> void add_all(cdgen &cx, tbl &t, Add add) {
+    for (const Record &record : records_of<Record>(&t)) {
+        t.release_before(reinterpret_cast<const char *>(&record));
         add(cx, record);
+    }
+    t.release();
+    t.restart(t.tbl_name);
 }
 
 /* The largest number among the records of a staged table; 0 if the table is empty. */
@@ -274,29 +283,34 @@ void drop_latest_class(cdgen &cx) {
         return;
     }
     for (size_t table = cdb::side_tables_as_made.size(); table-- > 0;)
-        drop_filed(cx, all.back().*cdb::side_tables_as_made[table].ref);
+        drop_filed(cx.store.of_classes, all.back().*cdb::side_tables_as_made[table].ref);
     classes.tbl_next -= sizeof(rsrc_class_t);
     memset(classes.tbl_next, 0, sizeof(rsrc_class_t));
 }
 
 void add_rsrc_class_tbls(cdgen &cx) {
-    add_all<rsrc_class_t>(cx, &cx.sections.rsrc_class_tbl, MSG_NO_CLASS_TABLES, add_class);
+    tbl &classes = cx.sections.rsrc_class_tbl;
+    require_table(classes, MSG_NO_CLASS_TABLES);
     store(cx.image.chp + offsetof(orb_cdb_header_t, cdb_hdr_max_class_id),
-          max_id(&cx.sections.rsrc_class_tbl, &rsrc_class_t::rc_class_id));
+          max_id(&classes, &rsrc_class_t::rc_class_id));
+    add_all<rsrc_class_t>(cx, classes, add_class);
 }
 
 void add_rsrc_mgr_tbls(cdgen &cx) {
-    add_all<rsrc_mgr_t>(cx, &cx.sections.rsrc_mgr_tbl, MSG_NO_MANAGER_TABLES, add_mgr);
-    store(cx.image.chp + offsetof(orb_cdb_header_t, cdb_hdr_max_rm_id),
-          max_id(&cx.sections.rsrc_mgr_tbl, &rsrc_mgr_t::rm_id));
+    tbl &managers = cx.sections.rsrc_mgr_tbl;
+    require_table(managers, MSG_NO_MANAGER_TABLES);
+    store(cx.image.chp + offsetof(orb_cdb_header_t, cdb_hdr_max_rm_id), max_id(&managers, &rsrc_mgr_t::rm_id));
+    add_all<rsrc_mgr_t>(cx, managers, add_mgr);
 }
 
 void add_rsrc_cmmap_tbls(cdgen &cx) {
-    add_all<rsrc_cmmap_t>(cx, &cx.sections.rsrc_cmmap_tbl, MSG_NO_MAP_TABLES, add_cmmap);
+    require_table(cx.sections.rsrc_cmmap_tbl, MSG_NO_MAP_TABLES);
+    add_all<rsrc_cmmap_t>(cx, cx.sections.rsrc_cmmap_tbl, add_cmmap);
 }
 
 void add_rsrc_var_class_tbls(cdgen &cx) {
-    add_all<rsrc_variable_class_t>(cx, &cx.sections.rsrc_var_class_tbl, MSG_NO_VARIABLE_CLASS_TABLES, add_var_class);
+    require_table(cx.sections.rsrc_var_class_tbl, MSG_NO_VARIABLE_CLASS_TABLES);
+    add_all<rsrc_variable_class_t>(cx, cx.sections.rsrc_var_class_tbl, add_var_class);
 }
 
 size_t fit_image(cdgen &cx) {

@@ -40,8 +40,7 @@ struct image_cursor {
  * it finds everything that can be wrong with an image before a file exists. */
 void bld_cdb(cdgen &cx);
 /* The same without a file, and always in the machine's own byte order: in memory that is filled with zeros and has the
- * size that fit_image returned. Returns how many bytes are used. Both give back the tables of classes that they have
- * written. */
+ * size that fit_image returned. Returns how many bytes are used. Both give back each table that they have written. */
 size_t fill_memory(cdgen &cx, std::span<std::byte> zeros);
 size_t fit_image(cdgen &cx);
 size_t cdb_size(cdgen &cx);

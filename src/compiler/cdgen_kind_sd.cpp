@@ -62,6 +62,31 @@ void dump_sd_element(cdgen &cx, tbl *str_tbl, const dflt_tbl *vtbl, size_t i, vx
         source_error(cx, mode == DFLT_DEFAULT ? MSG_NO_ELEMENT_DEFAULT : MSG_NO_ELEMENT_INITIAL);
 }
 
+constexpr size_t VALUES_AT_ONCE = 4096; /* how many are serialised before their memory is given back */
+
+/* Gives back the memory of the values before this one. Returns of how many cells. */
+size_t give_back_before(dflt_values &values, const vx_value_t &value, vx_data_type_t dt) {
+    const char *first = values.cells.tbl_base;
+    if (number_width(scalar_vx(dt)) == 0)
+        values.texts.give_back_before(value.ptr_char);
+    values.cells.release_before(reinterpret_cast<const char *>(&value));
+    return static_cast<size_t>(values.cells.tbl_base - first) / sizeof(vx_value_t);
+}
+
+/* Serialises all values. Those of a long list are given back meanwhile, because nothing needs them again. */
+void dump_values(cdgen &cx, tbl *str_tbl, const dflt_tbl *vtbl, vx_value_t *lval, vx_data_type_t dt) {
+    tbl_anchor array;
+    auto count = static_cast<vx_uint32_t>(vtbl->num_elems);
+    for (size_t i = 0, given_back = 0; i < vtbl->num_elems; ++i) {
+        const auto *value = record_at<vx_value_t>(&vtbl->tbl->cells, (i - given_back) * sizeof(vx_value_t));
+        if (i % VALUES_AT_ONCE == VALUES_AT_ONCE - 1)
+            given_back += give_back_before(*vtbl->tbl, *value, dt);
+        if (!copy_number(*lval, *value, dt) &&
+            copy_this_type(cx, lval, value, dt, TYPE_SAME, str_tbl, &array, count) != 0)
+            source_error(cx, MSG_DEFAULT_NOT_COPIED);
+    }
+}
+
 } // namespace
 
 vx_uint32_t mk_sd_sec(cdgen &cx) {
@@ -98,17 +123,9 @@ void cmplt_sd_tbl(cdgen &cx, const srtable_ctrl *scp) {
 }
 
 void dump_dflt(cdgen &cx, tbl *str_tbl, const dflt_tbl *vtbl, vx_value_t *lval, vx_data_type_t dt) {
+    if (scalar_vx(dt) != VX_SD_PTR)
+        return dump_values(cx, str_tbl, vtbl, lval, dt);
     sd_anchors anchors;
-    for (size_t i = 0; i < vtbl->num_elems; ++i) {
-        if (scalar_vx(dt) == VX_SD_PTR) {
-            dump_sd_element(cx, str_tbl, vtbl, i, lval, dt, &anchors);
-            continue;
-        }
-        const auto *value = record_at<vx_value_t>(&vtbl->tbl->cells, i * sizeof(vx_value_t));
-        if (copy_number(*lval, *value, dt))
-            continue;
-        auto count = static_cast<vx_uint32_t>(vtbl->num_elems);
-        if (copy_this_type(cx, lval, value, dt, TYPE_SAME, str_tbl, &anchors.array, count) != 0)
-            source_error(cx, MSG_DEFAULT_NOT_COPIED);
-    }
+    for (size_t i = 0; i < vtbl->num_elems; ++i)
+        dump_sd_element(cx, str_tbl, vtbl, i, lval, dt, &anchors);
 }

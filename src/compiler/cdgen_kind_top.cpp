@@ -96,7 +96,7 @@ void init_var_class_tbl(cdgen &cx) {
 }
 
 void cmplt_var_class_tbl(cdgen &cx) {
-    file_tbl(cx, cx.staged.cb_rsrc_variable_class.u_rvc_string_tbl);
+    file_tbl(cx, cx.store.of_variable_classes, cx.staged.cb_rsrc_variable_class.u_rvc_string_tbl);
     append_record(cx, &cx.sections.rsrc_var_class_tbl, cx.staged.cb_rsrc_variable_class);
     ++cx.sections.rsrc_var_class_count;
     cx.staged.cb_rsrc_variable_class.rvc_cb_ID = 0;
@@ -126,7 +126,7 @@ void cmplt_class_tbl(cdgen &cx) {
     flush_raw(cx, cx.staged.cb_rsrc_pattr, &rsrc_class_t::u_rc_pattrs, cx.valid_values.pattr_vv_found);
     flush_raw(cx, cx.staged.cb_rsrc_dattr, &rsrc_class_t::u_rc_dattrs, cx.valid_values.dattr_vv_found);
     for (const cdb::side_table &table : cdb::side_tables_as_made)
-        file_tbl(cx, rsrc_class.*table.ref);
+        file_tbl(cx, cx.store.of_classes, rsrc_class.*table.ref);
     append_record(cx, &cx.sections.rsrc_class_tbl, rsrc_class);
     ++cx.sections.rsrc_class_count;
     rsrc_class.rc_cb_ID = 0;

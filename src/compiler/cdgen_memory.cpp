@@ -26,6 +26,11 @@ bool is_limited() {
 
 } // namespace
 
+char *take_pages(size_t size) {
+    void *pages = mmap(nullptr, size, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+    return pages == MAP_FAILED ? nullptr : static_cast<char *>(pages);
+}
+
 char *reserve(size_t needed, size_t *size) {
     if (!PLENTIFUL || needed > SIZE_MAX / 2 || is_limited())
         return nullptr;

@@ -16,6 +16,12 @@ enum class memory_owner {
  * a partly used page does not matter. */
 constexpr size_t RESERVE_FROM = size_t{1} << 18;
 
+/* What has been written to the image is given back in pieces of this many bytes, whole pages. */
+constexpr size_t PIECE = size_t{1} << 16;
+
+/* Takes zero-filled pages with at least this many bytes, which give_back() returns to the system at once, unlike
+ * free(). Returns null, with errno, if there is no memory. */
+char *take_pages(size_t size);
 /* Reserves address space of at least this many bytes; *size is how many. Returns null where address space is scarce: on
  * 32-bit machines, and if the process has a memory limit. */
 char *reserve(size_t needed, size_t *size);

@@ -25,8 +25,8 @@ struct tbl_content {
 
     /* Frees the block, unless it belongs to a pool. */
     void release();
-    /* Gives back the first bytes of a block that is reserved, a multiple of RESERVE_FROM and less than it holds. */
-    void release_front(size_t bytes);
+    /* Gives back what is before this address in the block, in whole PIECEs, if the block is reserved. */
+    void release_before(const char *needed);
 
     char *tbl_base = nullptr;       /* null until the first reservation */
     char *tbl_next = nullptr;       /* first unreserved byte */
@@ -84,11 +84,15 @@ void make_room(cdgen &cx, tbl &t, size_t s);
 /* Frees the unused memory of a table after tbl_next. */
 void trim_tbl(tbl *t);
 
+struct filed_contents;
+
 /* Moves a finished table's bytes to compact storage and points the record at them, or at nothing if there are no bytes.
  * With many classes, most of the memory would otherwise be unused. The table itself is reused. */
-void file_tbl(cdgen &cx, cdb_ref_t &ref);
+void file_tbl(cdgen &cx, filed_contents &to, cdb_ref_t &ref);
 /* Frees a filed table's bytes. Several tables must be freed in the reverse order of their filing. */
-void drop_filed(cdgen &cx, const cdb_ref_t &ref);
+void drop_filed(filed_contents &from, const cdb_ref_t &ref);
+/* Gives back everything that was filed before this table. */
+void give_back_filed_before(filed_contents &from, const cdb_ref_t &ref);
 
 /* Appends len bytes, zero-filled up to a multiple of 8; returns their offset from tbl_base. add_to_tbl is the name that
  * serves for strings and serialised values. */
@@ -128,7 +132,8 @@ inline void stage_tbl(cdb_ref_t &ref, tbl_content *t) {
     std::memcpy(ref.pointer, &t, sizeof t);
 }
 
-/* Out-of-line values, texts and binaries, until they are serialised. */
+/* Memory for out-of-line values, texts and binaries, until they are serialised, and for small filed contents. It is
+ * used up in the order in which it was taken. */
 class text_pool {
 public:
     text_pool() = default;
@@ -138,15 +143,22 @@ public:
 
     /* n zeroed bytes, aligned for any value, that stay until the pool is emptied. Null if there is no memory. */
     char *take(size_t n);
-    /* Frees the memory at this address and after it, if it is in the latest chunk. */
+    /* Frees the memory at this address, which must have been taken, and after it. */
     void give_back_from(const char *taken);
+    /* Frees the chunks before the one that has this address, which must have been taken. */
+    void give_back_before(const char *taken);
     /* Frees everything except the latest chunk, which is reused. */
     void clear();
 
 private:
     struct chunk;
-    chunk *head = nullptr;
-    size_t left = 0; /* bytes of head not yet taken */
+    bool add_chunk(size_t n);
+    void free_earliest();
+    void free_latest();
+
+    chunk *earliest = nullptr;
+    chunk *latest = nullptr;
+    size_t left = 0; /* bytes of the latest chunk not yet taken */
 };
 
 struct free_memory {
@@ -155,17 +167,24 @@ struct free_memory {
     }
 };
 
+/* The contents of finished side tables, in the order of their records, in which the image takes them and they are given
+ * back. */
+struct filed_contents {
+    filed_contents() = default;
+    filed_contents(const filed_contents &) = delete;
+    filed_contents &operator=(const filed_contents &) = delete;
+    ~filed_contents();
+
+    text_pool pool;                /* contents of less than RESERVE_FROM bytes, each after its tbl_content */
+    std::deque<tbl_content> large; /* contents that have a block of their own */
+};
+
 /* The side tables of a compilation's records, and the contents of finished ones. */
 struct table_store {
-    table_store() = default;
-    table_store(const table_store &) = delete;
-    table_store &operator=(const table_store &) = delete;
-    ~table_store();
-
     std::deque<tbl> tables;          /* the records that own them refer to them */
     std::vector<tbl *> spare_tables; /* tables that have been filed, for reuse */
-    std::deque<tbl_content> filed;   /* contents of filed tables that have a block of their own */
-    text_pool filed_small;           /* small contents, each after its tbl_content */
+    filed_contents of_classes;
+    filed_contents of_variable_classes;
 };
 
 #endif

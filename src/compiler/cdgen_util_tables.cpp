@@ -25,10 +25,13 @@ void tbl_content::release() {
     tbl_capacity = 0;
 }
 
-void tbl_content::release_front(size_t bytes) {
-    give_back(tbl_base, bytes);
-    tbl_base += bytes;
-    tbl_capacity -= bytes;
+void tbl_content::release_before(const char *needed) {
+    if (tbl_owner != memory_owner::RESERVED)
+        return;
+    for (; static_cast<size_t>(needed - tbl_base) >= PIECE; tbl_base += PIECE) {
+        give_back(tbl_base, PIECE);
+        tbl_capacity -= PIECE;
+    }
 }
 
 tbl::~tbl() {
@@ -36,8 +39,8 @@ tbl::~tbl() {
     free(tbl_spare);
 }
 
-table_store::~table_store() {
-    for (tbl_content &content : filed)
+filed_contents::~filed_contents() {
+    for (tbl_content &content : large)
         content.release();
 }
 
@@ -205,14 +208,36 @@ void *tbl_at(tbl_content *t, size_t offset, size_t size) {
     return t->tbl_base + offset;
 }
 
-/* A pool grows by chunks for the values of several lines, each twice as large as the one before. clear() keeps the
- * latest chunk for reuse. */
+/* A pool grows by chunks for the values of several lines, each twice as large as the one before, up to a size that is
+ * worth giving back. What is large gets a chunk of its own. clear() keeps the latest chunk for reuse. */
 struct text_pool::chunk {
-    chunk *next;
+    chunk *before;
+    chunk *after;
     size_t size; /* bytes that follow */
 
     char *bytes() {
         return reinterpret_cast<char *>(this + 1);
+    }
+
+    bool contains(const char *address) {
+        return reinterpret_cast<uintptr_t>(address) - reinterpret_cast<uintptr_t>(bytes()) < size;
+    }
+
+    static chunk *make(size_t size) {
+        size_t whole = sizeof(chunk) + size;
+        return reinterpret_cast<chunk *>(has_pages(size) ? take_pages(whole) : static_cast<char *>(malloc(whole)));
+    }
+
+    void destroy() {
+        if (has_pages(size))
+            give_back(reinterpret_cast<char *>(this), sizeof(chunk) + size);
+        else
+            free(this);
+    }
+
+private:
+    static bool has_pages(size_t size) {
+        return sizeof(chunk) + size >= PIECE;
     }
 };
 
@@ -221,47 +246,70 @@ constexpr size_t POOL_CHUNK = 1024;
 } // namespace
 
 text_pool::~text_pool() {
-    while (head != nullptr)
-        free(std::exchange(head, head->next));
+    while (earliest != nullptr)
+        free_earliest();
+}
+
+bool text_pool::add_chunk(size_t n) {
+    constexpr size_t LARGEST = 2 * PIECE - sizeof(chunk);
+    size_t usual = latest == nullptr ? POOL_CHUNK : std::min(2 * latest->size, LARGEST);
+    size_t size = n > PIECE ? n : std::max(n, usual);
+    chunk *fresh = chunk::make(size);
+    if (fresh == nullptr)
+        return false;
+    *fresh = {latest, nullptr, size};
+    (latest == nullptr ? earliest : latest->after) = fresh;
+    latest = fresh;
+    left = size;
+    return true;
 }
 
 char *text_pool::take(size_t n) {
     n = round8(n);
-    if (head == nullptr || n > left) {
-        size_t size = std::max(n, head == nullptr ? POOL_CHUNK : 2 * head->size);
-        auto *fresh = static_cast<chunk *>(malloc(sizeof(chunk) + size));
-        if (fresh == nullptr)
-            return nullptr;
-        *fresh = {head, size};
-        head = fresh;
-        left = size;
-    }
-    char *taken = head->bytes() + (head->size - left);
+    if ((latest == nullptr || n > left) && !add_chunk(n))
+        return nullptr;
+    char *taken = latest->bytes() + (latest->size - left);
     left -= n;
     memset(taken, 0, n);
     return taken;
 }
 
+void text_pool::free_earliest() {
+    chunk *unused = std::exchange(earliest, earliest->after);
+    (earliest == nullptr ? latest : earliest->before) = nullptr;
+    unused->destroy();
+}
+
+void text_pool::free_latest() {
+    chunk *unused = std::exchange(latest, latest->before);
+    (latest == nullptr ? earliest : latest->after) = nullptr;
+    unused->destroy();
+}
+
 void text_pool::give_back_from(const char *taken) {
-    auto distance = reinterpret_cast<uintptr_t>(taken) - reinterpret_cast<uintptr_t>(head->bytes());
-    if (distance < head->size)
-        left = head->size - distance;
+    while (latest != nullptr && !latest->contains(taken))
+        free_latest();
+    if (latest != nullptr)
+        left = latest->size - static_cast<size_t>(taken - latest->bytes());
+}
+
+void text_pool::give_back_before(const char *taken) {
+    while (earliest != latest && !earliest->contains(taken))
+        free_earliest();
 }
 
 void text_pool::clear() {
-    if (head == nullptr)
+    if (latest == nullptr)
         return;
-    while (head->next != nullptr)
-        free(std::exchange(head->next, head->next->next));
-    left = head->size;
+    left = latest->size;
+    while (earliest != latest)
+        free_earliest();
 }
 
 namespace {
 
-constexpr size_t SMALL = 256; /* bytes: a block for as little would take half as much again */
-
-tbl_content *keep_copy(cdgen &cx, const tbl &t) {
-    char *content = cx.store.filed_small.take(sizeof(tbl_content) + t.used());
+tbl_content *keep_copy(filed_contents &to, const tbl &t) {
+    char *content = to.pool.take(sizeof(tbl_content) + t.used());
     if (content == nullptr)
         table_failure(t, MSG_NO_MEMORY_FOR_TABLE);
     char *bytes = content + sizeof(tbl_content);
@@ -269,31 +317,38 @@ tbl_content *keep_copy(cdgen &cx, const tbl &t) {
     return new (content) tbl_content{bytes, bytes + t.used(), t.tbl_name, memory_owner::POOL};
 }
 
-tbl_content *keep_block(cdgen &cx, tbl &t) {
+tbl_content *keep_block(filed_contents &to, tbl &t) {
     trim_tbl(&t);
-    tbl_content *kept = &cx.store.filed.emplace_back(t);
+    tbl_content *kept = &to.large.emplace_back(t);
     static_cast<tbl_content &>(t) = {.tbl_name = t.tbl_name};
     return kept;
 }
 
 } // namespace
 
-void file_tbl(cdgen &cx, cdb_ref_t &ref) {
+void file_tbl(cdgen &cx, filed_contents &to, cdb_ref_t &ref) {
     tbl *open = staged_tbl(ref);
     if (open->used() == 0)
         stage_tbl(ref, nullptr);
     else
-        stage_tbl(ref, open->used() <= SMALL ? keep_copy(cx, *open) : keep_block(cx, *open));
+        stage_tbl(ref, open->used() < RESERVE_FROM ? keep_copy(to, *open) : keep_block(to, *open));
+    open->release();
     cx.store.spare_tables.push_back(open);
 }
 
-void drop_filed(cdgen &cx, const cdb_ref_t &ref) {
+void drop_filed(filed_contents &from, const cdb_ref_t &ref) {
     tbl_content *kept = staged_content(ref);
     if (kept == nullptr)
         return;
     if (kept->tbl_owner == memory_owner::POOL)
-        return cx.store.filed_small.give_back_from(reinterpret_cast<const char *>(kept));
+        return from.pool.give_back_from(reinterpret_cast<const char *>(kept));
     kept->release();
-    if (kept == &cx.store.filed.back())
-        cx.store.filed.pop_back();
+    if (kept == &from.large.back())
+        from.large.pop_back();
+}
+
+void give_back_filed_before(filed_contents &from, const cdb_ref_t &ref) {
+    const tbl_content *kept = staged_content(ref);
+    if (kept != nullptr && kept->tbl_owner == memory_owner::POOL)
+        from.pool.give_back_before(reinterpret_cast<const char *>(kept));
 }

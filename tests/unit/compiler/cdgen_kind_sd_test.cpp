@@ -407,7 +407,7 @@ TEST(Run, SecondOneOfAnAttributeTakesTheAttribute) {
 /* Deliberate: at the end of the source attributes are completed before the run that may be theirs. */
 TEST(Run, AtTheEndOfTheSourceComesAfterItsAttribute) {
     compilation c;
-    c.compile_all(CLASS + MAP + pattr(P, "SD") + element("PAttrSDDefinition", 0, "Int32"));
+    c.stage_all(CLASS + MAP + pattr(P, "SD") + element("PAttrSDDefinition", 0, "Int32"));
     const rsrc_class_t &filed = records_of<rsrc_class_t>(&c.cx.sections.rsrc_class_tbl)[0];
     const rsrc_pattr_t &attr = records_of<rsrc_pattr_t>(staged_content(filed.u_rc_pattrs))[0];
     EXPECT_EQ(attr.u_ra_sd.offset[0], 0U);

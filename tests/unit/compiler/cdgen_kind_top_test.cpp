@@ -260,7 +260,7 @@ TEST(Locator, IsTheIdOfThePersistentResourceAttributeOfItsName) {
     };
     for (const auto &[text, locator] : rows) {
         compilation c;
-        c.compile_all(BEFORE + text);
+        c.stage_all(BEFORE + text);
         EXPECT_EQ(records_of<rsrc_class_t>(&c.cx.sections.rsrc_class_tbl)[0].rc_locator, locator) << text;
     }
 }
@@ -269,7 +269,7 @@ TEST(Locator, IsNoneUnlessGiven) {
     const std::string AFTER = named_attribute("PersistentResourceAttribute", "Here", "5") + MAP;
     for (const std::string &before : {CLASS + class_values(), CLASS + class_values({"Locator=\"\""})}) {
         compilation c;
-        c.compile_all(before + AFTER);
+        c.stage_all(before + AFTER);
         EXPECT_EQ(records_of<rsrc_class_t>(&c.cx.sections.rsrc_class_tbl)[0].rc_locator, 0xFFFFU);
     }
 }
@@ -277,8 +277,8 @@ TEST(Locator, IsNoneUnlessGiven) {
 /* Deliberate: at the end, of the class that is open then. */
 TEST(Locator, IsLookedUpInTheLastClass) {
     compilation c;
-    c.compile_all(CLASS + class_values({"Locator=Here"}) + named_attribute("PersistentResourceAttribute", "Here", "5") +
-                  CLASS + class_values() + named_attribute("PersistentResourceAttribute", "Here", "6") + MAP);
+    c.stage_all(CLASS + class_values({"Locator=Here"}) + named_attribute("PersistentResourceAttribute", "Here", "5") +
+                CLASS + class_values() + named_attribute("PersistentResourceAttribute", "Here", "6") + MAP);
     auto classes = records_of<rsrc_class_t>(&c.cx.sections.rsrc_class_tbl);
     ASSERT_EQ(classes.size(), 2U);
     EXPECT_EQ(classes[0].rc_locator, 0U);
@@ -366,7 +366,7 @@ TEST(Manager, NameIsKeptAndTheMapRefersToTheFirst) {
 
 TEST(Manager, IsMadeOfItsNameAtTheEnd) {
     compilation c;
-    c.compile_all(CLASS + class_values() + MAP);
+    c.stage_all(CLASS + class_values() + MAP);
     auto managers = records_of<rsrc_mgr_t>(&c.cx.sections.rsrc_mgr_tbl);
     ASSERT_EQ(managers.size(), 1U);
     EXPECT_EQ(managers[0].rm_id, 0U);

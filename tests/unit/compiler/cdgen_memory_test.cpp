@@ -2,7 +2,11 @@
 
 #include "compiler/util_fixture.h"
 
+#include "compiler/cdgen_kinds.h"
+
+#include <sys/mman.h>
 #include <sys/resource.h>
+#include <unistd.h>
 
 namespace {
 
@@ -25,6 +29,22 @@ protected:
     static bool may_reserve() {
         rlimit limit = {};
         return sizeof(size_t) > 4 && getrlimit(RLIMIT_AS, &limit) == 0 && limit.rlim_cur == RLIM_INFINITY;
+    }
+
+    /* Whether there is memory at this address, which has once been in whole pages of its own. */
+    static bool has_pages(const void *address) {
+        auto page = static_cast<uintptr_t>(sysconf(_SC_PAGESIZE));
+        uintptr_t first = reinterpret_cast<uintptr_t>(address) / page * page;
+        return msync(reinterpret_cast<void *>(first), page, MS_ASYNC) == 0;
+    }
+
+    /* A record's finished table of this many bytes. */
+    cdb_ref_t filed(size_t length) {
+        cdb_ref_t ref;
+        stage_tbl(ref, make_tbl(cx, 32, "Records"));
+        fill(*staged_tbl(ref), length);
+        file_tbl(cx, cx.store.of_classes, ref);
+        return ref;
     }
 
     cdgen cx;
@@ -100,12 +120,16 @@ TEST_F(LargeTables, AreGivenBackPieceByPiece) {
         GTEST_SKIP() << "address space is limited";
     tbl t(8192, "Records");
     fill(t, 3 * RESERVE_FROM);
-    t.release_front(RESERVE_FROM);
-    EXPECT_EQ(t.used(), 2 * RESERVE_FROM);
+    const char *base = t.tbl_base;
+    t.release_before(base + 2 * PIECE - 1);
+    EXPECT_FALSE(has_pages(base));
+    t.release_before(base + 2 * PIECE - 1); /* what is left is less than a piece */
+    EXPECT_EQ(t.used(), 3 * RESERVE_FROM - PIECE);
     size_t number = 0;
     memcpy(&number, t.tbl_base, sizeof number);
-    EXPECT_EQ(number, RESERVE_FROM);
+    EXPECT_EQ(number, PIECE);
     t.release();
+    EXPECT_FALSE(has_pages(base + PIECE));
     EXPECT_EQ(t.tbl_base, nullptr);
     EXPECT_EQ(t.used(), 0U);
 }
@@ -114,9 +138,62 @@ TEST_F(LargeTables, PartsOfAPoolStay) {
     cdb_ref_t ref;
     stage_tbl(ref, make_tbl(cx, 32, "Records"));
     memcpy(alloc_tble(cx, staged_tbl(ref), 8), "seven..", 8);
-    file_tbl(cx, ref);
+    file_tbl(cx, cx.store.of_classes, ref);
     staged_content(ref)->release();
     EXPECT_STREQ(staged_content(ref)->tbl_base, "seven..");
+}
+
+TEST_F(LargeTables, FiledOnesAreGivenBackInTheirOrder) {
+    std::vector<cdb_ref_t> refs;
+    for (size_t i = 0; i < 100; ++i)
+        refs.push_back(filed(PIECE / 8));
+    const char *early = staged_content(refs[60])->tbl_base;
+    give_back_filed_before(cx.store.of_classes, refs[99]);
+    EXPECT_FALSE(has_pages(early));
+    expect_filled(*staged_content(refs[99]));
+    give_back_filed_before(cx.store.of_classes, filed(0)); /* there is none */
+    expect_filled(*staged_content(refs[99]));
+}
+
+TEST_F(LargeTables, FiledOnesAreDroppedInTheReverseOrder) {
+    cdb_ref_t kept = filed(8);
+    const char *latest = staged_content(filed(2 * PIECE))->tbl_base;
+    for (size_t length : {size_t{3000}, 2 * PIECE, 2 * RESERVE_FROM}) {
+        std::vector<cdb_ref_t> refs;
+        for (size_t i = 0; i < 50; ++i)
+            refs.push_back(filed(length));
+        for (; !refs.empty(); refs.pop_back())
+            drop_filed(cx.store.of_classes, refs.back());
+        EXPECT_TRUE(cx.store.of_classes.large.empty());
+    }
+    EXPECT_TRUE(has_pages(latest));
+    const char *next = staged_content(filed(8))->tbl_base;
+    EXPECT_EQ(staged_content(filed(8))->tbl_base, next + sizeof(tbl_content) + 8);
+    expect_filled(*staged_content(kept));
+}
+
+TEST_F(LargeTables, ValuesAreGivenBackWhileTheyAreSerialised) {
+    if (!may_reserve())
+        GTEST_SKIP() << "address space is limited";
+    constexpr size_t COUNT = 100'000;
+    tbl strings(8192, "Strings");
+    dflt_tbl list{std::make_shared<dflt_values>("DefaultValues"), COUNT};
+    for (size_t i = 0; i < COUNT; ++i) {
+        vx_value_t value = {.ptr_char = list.tbl->texts.take(8)};
+        *value.ptr_char = static_cast<char>('a' + i % 26);
+        memcpy(alloc_tble(cx, &list.tbl->cells, sizeof value), &value, sizeof value);
+    }
+    const auto *first = reinterpret_cast<const vx_value_t *>(list.tbl->cells.tbl_base);
+    const char *early = first[30'000].ptr_char; /* after the chunks that are on the heap */
+    vx_value_t array = {};
+    dump_dflt(cx, &strings, &list, &array, VX_CHAR_PTR_ARRAY);
+    EXPECT_FALSE(has_pages(first));
+    EXPECT_FALSE(has_pages(early));
+    const auto *cells = record_at<vx_array_t>(&strings, array.val_uint32);
+    EXPECT_EQ(cells->element_count, COUNT);
+    for (size_t i = 0; i < COUNT; ++i)
+        EXPECT_EQ(strings.tbl_base[record_at<vx_value_t>(&strings, array.val_uint32 + 8 + 8 * i)->val_uint32],
+                  static_cast<char>('a' + i % 26));
 }
 
 } // namespace

@@ -490,6 +490,36 @@ TEST(Pools, UseTheLatestChunkAgain) {
     EXPECT_EQ(values.texts.take(8), text);
 }
 
+TEST(Pools, GiveBackFromAnAddress) {
+    text_pool pool;
+    char *kept = pool.take(16);
+    char *first = pool.take(3000); /* in the second chunk */
+    memset(kept, 'k', 16);
+    for (int round = 0; round < 2; ++round) {
+        memset(pool.take(1'000'000), 'x', 1'000'000);
+        pool.take(100'000);
+        pool.give_back_from(first);
+        EXPECT_EQ(pool.take(2000), first);
+        EXPECT_EQ(bytes_at(first, 2000), std::string(2000, '\0'));
+    }
+    EXPECT_EQ(bytes_at(kept, 16), std::string(16, 'k'));
+    pool.give_back_from(kept);
+    EXPECT_EQ(pool.take(8), kept);
+}
+
+TEST(Pools, GiveBackBeforeAnAddress) {
+    text_pool pool;
+    std::vector<char *> all;
+    for (size_t i = 0; i < 1000; ++i)
+        memset(all.emplace_back(pool.take(1000)), static_cast<char>(i), 1000);
+    for (size_t from : {400U, 400U, 999U}) {
+        pool.give_back_before(all[from]);
+        for (size_t i = from; i < 1000; ++i)
+            EXPECT_EQ(bytes_at(all[i], 1000), std::string(1000, static_cast<char>(i)));
+    }
+    EXPECT_EQ(pool.take(8), all[999] + 1000);
+}
+
 TEST(Pools, SayWhenThereIsNoMemory) {
     text_pool pool;
     char *taken = pool.take(8);

@@ -216,18 +216,18 @@ const tbl_content *filed(cdgen &cx, size_t length) {
     stage_tbl(ref, make_tbl(cx, 32, "Records"));
     tbl *t = staged_tbl(ref);
     memset(alloc_tble(cx, t, length), 'x', length);
-    file_tbl(cx, ref);
+    file_tbl(cx, cx.store.of_classes, ref);
     return staged_content(ref);
 }
 
 TEST_F(Tables, FiledOnesKeepWhatTheyHold) {
-    for (size_t length : {1U, 32U, 256U, 257U, 100000U}) { /* up to 256: without a block of their own */
+    for (size_t length : {size_t{1}, size_t{256}, size_t{100000}, RESERVE_FROM - 1, RESERVE_FROM, RESERVE_FROM + 9}) {
         const tbl_content *content = filed(cx, length);
         const tbl_content *next = filed(cx, length); /* leaves the one before it alone */
         EXPECT_NE(content, next);
         EXPECT_STREQ(content->tbl_name, "Records");
         EXPECT_EQ(std::string(content->tbl_base, content->used()), std::string(length, 'x'));
-        EXPECT_EQ(cx.store.filed.size(), length <= 256 ? 0U : length == 257 ? 2U : 4U);
+        EXPECT_EQ(cx.store.of_classes.large.size(), length < RESERVE_FROM ? 0U : length == RESERVE_FROM ? 2U : 4U);
     }
 }
 
@@ -235,7 +235,7 @@ TEST_F(Tables, FiledOnesThatHoldNothingAreNone) {
     cdb_ref_t ref;
     stage_tbl(ref, make_tbl(cx, 32, "Records"));
     reserve(*staged_tbl(ref), 0);
-    file_tbl(cx, ref);
+    file_tbl(cx, cx.store.of_classes, ref);
     EXPECT_EQ(staged_content(ref), nullptr);
     EXPECT_TRUE(records_of<vx_uint32_t>(staged_content(ref)).empty());
 }
@@ -245,7 +245,7 @@ TEST_F(Tables, FiledOnesServeAgain) {
     tbl *first = make_tbl(cx, 8192, "First");
     stage_tbl(ref, first);
     reserve(*first, 9000);
-    file_tbl(cx, ref);
+    file_tbl(cx, cx.store.of_classes, ref);
     tbl *second = make_tbl(cx, 32, "Second");
     EXPECT_EQ(second, first);
     EXPECT_EQ(cx.store.tables.size(), 1U);

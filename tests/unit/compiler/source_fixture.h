@@ -3,6 +3,7 @@
 #define CDGEN_TESTS_SOURCE_FIXTURE_H
 
 #include "compiler/cdgen.h"
+#include "compiler/cdgen_closing.h"
 #include "compiler/cdgen_stanzas.h"
 #include "compiler/given_interface.h"
 
@@ -149,6 +150,13 @@ public:
     }
     ending compiling(std::string_view text) {
         return ending_of([&] { compile_all(text); });
+    }
+
+    /* All phases before the image, which gives back all records. */
+    void stage_all(std::string_view text) {
+        read(text);
+        for (closing_step step : closing_steps)
+            step(cx);
     }
 
     /* Passes one attribute line to the parser alone. The message of a failure may refer to the line's text. */

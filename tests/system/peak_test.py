@@ -1,0 +1,46 @@
+"""Test that a compilation takes at most 1.6 times the memory of the database: each staging table is given back as soon
+as it is in the image.
+
+The databases are so large that the interpreter, which the program is forked from, takes less memory.
+"""
+
+import itertools
+import os
+import subprocess
+
+import pytest
+
+from programs import PROGRAMS, environment, runner
+
+PROGRAM = 2 << 20  # bytes of the program itself and of what does not depend on the database
+HEAD = ("ControlDefinition\nResourceClass\n\tDescription=1\n\tDisplayName=2\n\tProperties=HasResources\n"
+        "\tClassPermTemplate=0\n\tResourcePermTemplate=0\n\tName=C{}\n")
+VALUES = ("PersistentResourceAttribute\n\tName=A\n\tDescription=1\n\tDisplayName=2\n\tId=1\n\tDataType=Int32\n"
+          "\tVarietyRange=1,9\n" + "".join(f"\tValidValue={value},{value}\n" for value in range(200)))
+VARIABLE_CLASS = "ResourceVariableClass\n\tVariableClass=Group_{}\n\tObservationInterval=1\n"
+MAP = "ClassToManagerMapping\n\tResourceManager=M\n\tFirstKey=1\n\tLastKey=9\n\tDescriptiveMessageSet=1\n"
+
+SOURCES = {
+    "records": lambda: itertools.repeat("ControlDefinition\n", 300_000),
+    "small contents": lambda: map(HEAD.format, range(300_000)),
+    "contents": lambda: (HEAD.format(number) + VALUES for number in range(14_000)),
+    "variable classes": lambda: itertools.chain([HEAD], map(VARIABLE_CLASS.format, range(1_000_000))),
+}
+
+
+@pytest.mark.slow(5)
+@pytest.mark.parametrize("option", ["-n", "-s"])
+@pytest.mark.parametrize("what", SOURCES)
+def test_peak(directory, what, option):
+    if PROGRAMS.sanitizers or runner():
+        pytest.skip("a sanitizer or an emulator takes memory of its own")
+    with (directory / "source").open("w") as source:
+        source.writelines(SOURCES[what]())
+        source.write(MAP)
+    with subprocess.Popen([PROGRAMS.cdgen, option, "source", "c.cdef"], cwd=directory, env=environment()) as process:
+        _, status, used = os.wait4(process.pid, 0)
+        process.returncode = os.waitstatus_to_exitcode(status)
+    assert process.returncode == 0
+    size = (directory / "c.cdef").stat().st_size
+    assert size > 64 << 20
+    assert used.ru_maxrss * 1024 <= 1.6 * size + PROGRAM

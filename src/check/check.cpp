@@ -27,8 +27,9 @@ struct source_check {
           warned(wanted, found) {}
 
     totals run();
-    void take(source_line &source);
-    void take_returns(source_line &source);
+    bool read_line();
+    void take_line();
+    bool take_returns();
     void hand_over(finding &&each);
     bool is_open(warning_id id, int at_line) const;
     void finish();
@@ -46,20 +47,28 @@ struct source_check {
     recovery recover = {compiler, line, known, found, see, warned};
 };
 
-/* Notes how to remove the carriage returns at the end of the line, and removes the last one if they are ignored. */
-void source_check::take_returns(source_line &source) {
+/* Notes how to remove the carriage returns at the end of the line. True if the last one is to be ignored. */
+[[gnu::noinline]] bool source_check::take_returns() {
     if (std::optional<edit> removal = line.without_returns(); removal && returns.size() < RETURNS_MAX)
         returns.push_back(std::move(*removal));
-    if (recover.strips_returns() && line.raw.ends_with('\r'))
-        --source.end;
+    return recover.strips_returns() && line.raw.ends_with('\r');
 }
 
-void source_check::take(source_line &source) {
+/* Reads the next line and finds its text; false at the end of the source. All that it calls is inlined, as it is in the
+ * compiler's own loop, where it is also called for every line. */
+[[gnu::flatten]] bool source_check::read_line() {
+    source_line source = compiler.next_line();
+    if (source.begin == nullptr)
+        return false;
     line.read(source, compiler.line_number());
-    if (line.carriage_return() < line.raw.size())
-        take_returns(source);
+    if (line.carriage_return() < line.raw.size() && take_returns())
+        --source.end;
     warned.line(see);
-    new (&line.text) attr_text(text_of(source)); /* in place: a copy would wait for what has just been written */
+    line.text = text_of(source);
+    return true;
+}
+
+void source_check::take_line() {
     if (line.text.end == nullptr)
         return;
     if (line.text.name == line.text.line)
@@ -91,12 +100,8 @@ bool source_check::is_open(warning_id id, int at_line) const {
 }
 
 totals source_check::run() {
-    for (;;) {
-        source_line source = compiler.next_line();
-        if (source.begin == nullptr)
-            break;
-        take(source);
-    }
+    while (read_line())
+        take_line();
     compiler.close();
     line.end_source();
     recover.close_all();

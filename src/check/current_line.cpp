@@ -19,29 +19,29 @@ bool is_within(const char *p, const char *begin, const char *end) {
 
 } // namespace
 
-void current_line::read(const source_line &source, int line_number) {
+[[gnu::noinline]] void current_line::read_after_piece(int line_number) {
     characters_before = fills_piece ? characters_before + text::characters_in(raw) : 0;
-    size_t length = std::min(static_cast<size_t>(source.end - source.begin), read_bytes.size());
-    memmove(read_bytes.data(), source.begin, length); /* GCC makes a slow loop of memcpy */
-    raw = {read_bytes.data(), length};
-    find_return(source);
-    number = line_number;
     continues = fills_piece;
-    fills_piece = raw.size() == LINE_MAX_CHARS;
-    has_newline = source.read_end > source.end;
     if (continues)
-        rests.push_back(number);
+        rests.push_back(line_number);
 }
 
-/* Carriage returns are rare, so the next one is searched for once in the whole buffer. */
-void current_line::find_return(const source_line &source) {
-    bool read_anew = read_end != source.read_end || source.begin <= begin;
-    begin = source.begin;
-    if (!read_anew && next_return >= begin)
-        return;
-    read_end = source.read_end;
-    const void *found = memchr(begin, '\r', static_cast<size_t>(read_end - begin));
-    next_return = found == nullptr ? read_end : static_cast<const char *>(found);
+/* Many lines at a time, because copying each by itself would take longer than checking it. */
+[[gnu::noinline]] void current_line::save(const char *from, const char *to) {
+    size_t length = std::min(static_cast<size_t>(to - from), saved.size());
+    memmove(saved.data(), from, length); /* GCC makes a slow loop of memcpy */
+    saved_begin = begin = from;
+    saved_end = from + length;
+    saved_of = to;
+    find_return();
+}
+
+/* Carriage returns are rare, so the next one is searched for once in all that is saved. */
+[[gnu::noinline]] void current_line::find_return() {
+    const void *found = memchr(saved.data() + (begin - saved_begin), '\r', static_cast<size_t>(saved_end - begin));
+    size_t at = found == nullptr ? static_cast<size_t>(saved_end - saved_begin)
+                                 : static_cast<size_t>(static_cast<const char *>(found) - saved.data());
+    next_return = saved_begin + at;
 }
 
 void current_line::end_source() {

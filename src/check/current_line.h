@@ -23,8 +23,20 @@ public:
     current_line(const current_line &) = delete;
     current_line &operator=(const current_line &) = delete;
 
-    /* The next line as it was read, with its number. */
-    void read(const source_line &source, int number);
+    /* The next line, with its number, before the compiler takes it apart. */
+    void read(const source_line &source, int line_number) {
+        if (is_piece())
+            read_after_piece(line_number);
+        if (!is_saved(source))
+            save(source.begin, source.read_end);
+        begin = source.begin;
+        if (next_return < begin)
+            find_return();
+        raw = {saved.data() + (begin - saved_begin), static_cast<size_t>(source.end - begin)};
+        number = line_number;
+        fills_piece = raw.size() == LINE_MAX_CHARS;
+        has_newline = source.read_end > source.end;
+    }
     /* Its text, without comment; end is null if it has none. The compiler takes the text apart in place. */
     void set_text(const attr_text &line_text) {
         text = line_text;
@@ -99,12 +111,22 @@ private:
     size_t column_of(const char *in_text) const {
         return static_cast<size_t>(is_copied(in_text) ? in_text - copy.data() - copy_added : in_text - text.line) + 1;
     }
-    void find_return(const source_line &source);
+    bool is_saved(const source_line &source) const {
+        return saved_of == source.read_end && source.begin > begin && source.end <= saved_end;
+    }
+    void read_after_piece(int line_number);
+    void save(const char *from, const char *to);
+    void find_return();
 
-    std::array<char, LINE_MAX_CHARS> read_bytes; /* holds raw: the compiler takes the line itself apart */
-    const char *begin = nullptr;                 /* of the line, in the buffer */
-    const char *read_end = nullptr;              /* of what the buffer held when next_return was looked for */
-    const char *next_return = nullptr; /* the first carriage return from begin on, or read_end if there is none */
+    static constexpr size_t SAVED_MAX = 4096;
+
+    /* The lines of the buffer from a line on, as they were read: the compiler takes each line apart. It holds raw. */
+    std::array<char, SAVED_MAX> saved;
+    const char *saved_begin = nullptr; /* where the saved bytes are in the buffer */
+    const char *saved_end = nullptr;
+    const char *saved_of = nullptr;    /* the end of what the buffer held */
+    const char *begin = nullptr;       /* of the line, in the buffer */
+    const char *next_return = nullptr; /* the first carriage return from begin on, or saved_end if there is none */
     std::array<char, 512> copy;        /* holds a replaced text */
     std::ptrdiff_t copy_added = 0;
     bool fills_piece = false;

@@ -39,6 +39,23 @@ TEST(Check, TakesSourcesLargerThanTheReadBuffer) {
     EXPECT_EQ(found_in(CLASS + comments + "Unknwon\n"), codes{"S101 200016:1+7"});
 }
 
+/* Lines are saved many at a time, before the compiler takes them apart; those in pieces are saved by themselves. */
+TEST(Check, ShowsEachLineAsItWasRead) {
+    std::string source = CLASS;
+    std::vector<std::string> expected;
+    for (int i = 0; i < 20000; ++i) {
+        expected.push_back("Unknown" + std::to_string(i) + "=\"" + std::string(static_cast<size_t>(i) % 100, 'x') +
+                           "\"  #");
+        source += expected.back() + "\n";
+        if (i % 500 == 0)
+            source += "#" + std::string(600, '#') + "\n";
+    }
+    std::vector<check::finding> found = findings_in(source, {});
+    ASSERT_EQ(found.size(), expected.size());
+    for (size_t i = 0; i < found.size(); ++i)
+        EXPECT_EQ(found[i].source, expected[i]);
+}
+
 TEST(Check, TakesEveryByte) {
     std::string bytes = CLASS;
     for (int byte = 0; byte < 256; ++byte)

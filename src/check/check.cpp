@@ -23,8 +23,8 @@ constexpr size_t RETURNS_MAX = 65536; /* the most carriage returns that are remo
 /* One check of one source, whose name must outlive it. */
 struct source_check {
     source_check(const std::string &name, const warning_set &wanted, const sink &handed_to, const compile_job *compile)
-        : job(compile), compiler(name.c_str(), job == nullptr ? nullptr : job->output.c_str()), to(handed_to),
-          warned(wanted, found) {}
+        : job(compile), compiler(name.c_str(), job == nullptr ? nullptr : job->output.c_str()), known(wanted),
+          to(handed_to), warned(wanted, found) {}
 
     totals run();
     bool read_line();

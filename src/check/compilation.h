@@ -52,6 +52,9 @@ public:
     bool is_broken(int kind) const {
         return broken.test(index_of(kind));
     }
+    bool any_broken() const {
+        return broken.any();
+    }
     void set_broken(int kind, bool is = true) {
         broken.set(index_of(kind), is);
     }

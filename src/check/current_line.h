@@ -37,10 +37,6 @@ public:
         fills_piece = raw.size() == LINE_MAX_CHARS;
         has_newline = source.read_end > source.end;
     }
-    /* Its text, without comment; end is null if it has none. The compiler takes the text apart in place. */
-    void set_text(const attr_text &line_text) {
-        text = line_text;
-    }
     /* No line follows. */
     void end_source();
 
@@ -65,6 +61,10 @@ public:
     /* Part of the value of an attribute of this line. */
     place part_of(const attr_place &attr, size_t offset, size_t length) const {
         return {number, column_of(attr.value) + offset, length};
+    }
+    /* The column of a character of the text. */
+    size_t column_of(const char *in_text) const {
+        return static_cast<size_t>(is_copied(in_text) ? in_text - copy.data() - copy_added : in_text - text.line) + 1;
     }
     /* The place that an error of this line marks. item: the part of the line that the error names, if it names one. */
     place marked(mark_kind kind, const attr_place &attr, const char *item = nullptr) const;
@@ -99,7 +99,7 @@ public:
     }
 
     std::string_view raw; /* the line as it was read */
-    attr_text text = {};
+    attr_text text = {};  /* its text, without comment; end is null if it has none */
     int number = 0;
     bool continues = false; /* the line is the rest of one that is too long to be read in one piece */
     bool ended = false;     /* the source has ended; raw is still its last line */
@@ -107,9 +107,6 @@ public:
 private:
     bool is_copied(const char *in_text) const {
         return std::greater_equal<>()(in_text, copy.data()) && std::less<>()(in_text, copy.data() + copy.size());
-    }
-    size_t column_of(const char *in_text) const {
-        return static_cast<size_t>(is_copied(in_text) ? in_text - copy.data() - copy_added : in_text - text.line) + 1;
     }
     bool is_saved(const source_line &source) const {
         return saved_of == source.read_end && source.begin > begin && source.end <= saved_end;

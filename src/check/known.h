@@ -31,6 +31,10 @@ inline const srtable_ctrl &table_of(int kind) {
     return sc_tables[index_of(kind)];
 }
 
+inline std::string_view name_of(const table_attrs &attr) {
+    return {attr.ta_name, attr.ta_length};
+}
+
 inline bool is_sd_kind(int kind) {
     return table_of(kind).sc_sd_owner != nullptr;
 }
@@ -117,8 +121,14 @@ struct element_run {
     std::vector<mention> without_index; /* headers of elements without ElementIndex, since the latest wrong index */
 };
 
-/* Names and Ids that the current class gives, or for elements the current run. */
+/* Names and Ids that the current class gives, or for elements the current run. Kept only for the warnings that look at
+ * them. */
 struct declarations {
+    explicit declarations(const warning_set &wanted)
+        : keeps_names(wanted[SAME_NAME] || wanted[UNKNOWN_LOCATOR]), keeps_ids(wanted[SAME_ID]) {}
+
+    bool keeps_names;
+    bool keeps_ids;
     std::array<first_lines, SC_COUNT> names;
     std::array<first_lines, SC_COUNT> ids;
     int earlier_name = 0; /* the line that gave the current line's name first; 0: none did */
@@ -126,6 +136,8 @@ struct declarations {
 };
 
 struct knowledge {
+    explicit knowledge(const warning_set &wanted) : declared(wanted) {}
+
     const stanza_record &stanza() const {
         return stanzas[index_of(kind)];
     }

@@ -40,7 +40,7 @@ void forget_declarations(declarations &declared, int next_kind, bool begins_run,
 
 /* guessed: the header is what a misspelt one may have meant. */
 void recovery::take_header(const attr_text &text, bool guessed) {
-    int kind = set_table_id(text.name);
+    int kind = set_table_id({text.name, static_cast<size_t>(text.end - text.name)});
     if (kind >= 0) {
         end_stanza(kind);
         bool begins_run = is_sd_kind(kind) && (!compiler.run_is_open() || known.kind != kind);

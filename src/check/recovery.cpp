@@ -4,7 +4,6 @@
 
 #include "check/lacking.h"
 #include "check/notes.h"
-#include "check/numbers.h"
 
 #include <algorithm>
 #include <utility>
@@ -139,7 +138,7 @@ void recovery::abandon(int kind, const fatal_exit &failure) {
 void recovery::settle_broken(int next_kind) {
     if (compiler.run_is_open() && compiler.is_broken(known.run.kind))
         compiler.complete_element();
-    if (next_kind >= 0 && is_sd_kind(next_kind))
+    if (!compiler.any_broken() || (next_kind >= 0 && is_sd_kind(next_kind)))
         return;
     for (int kind : {SC_PERSISTENT_RESOURCE_ATTRIBUTE, SC_PERSISTENT_CLASS_ATTRIBUTE, SC_DYNAMIC_RESOURCE_ATTRIBUTE,
                      SC_DYNAMIC_CLASS_ATTRIBUTE, SC_RESOURCE_ACTION, SC_CLASS_ACTION})
@@ -163,83 +162,6 @@ void recovery::lose_header(const kind_set &kinds) {
 void recovery::break_if_incomplete(int kind) {
     if (!compiler.is_complete(kind))
         compiler.set_broken(kind);
-}
-
-/* ---- Attributes that have been taken --------------------------------------------------------------------------- */
-
-void recovery::note_given() {
-    const attr_place &latest = compiler.latest();
-    if (latest.attr == nullptr)
-        return;
-    stanza_record &stanza = known.stanza();
-    int &given = stanza.given[static_cast<size_t>(latest.attr - table_of(known.kind).sc_attrs.data())];
-    if (given == 0) {
-        given = line.number;
-        stanza.suspect = false;
-        if (known.kind == SC_RESOURCE_VARIABLE_CLASS && std::string_view(latest.attr->ta_name) == "VariableClass")
-            known.variable_class_names.push_back(see.value_mention());
-    }
-    if (known.kind == SC_CLASS_TO_MANAGER_MAPPING)
-        known.map_values.push_back({see.value_place(), latest.attr->ta_name, std::string(line.raw)});
-    if (latest.attr->ta_type == AT_SD_INDEX)
-        index_lost = false;
-}
-
-void recovery::note_refused(const std::optional<int> &attr_type) {
-    compiler.set_broken(known.kind);
-    known.stanza().refused.add(attr_type);
-}
-
-/* In place, since this is done for each attribute and element. */
-void recovery::note_value() {
-    known.declared.earlier_name = known.declared.earlier_id = 0;
-    int type = see.attr().ta_type;
-    if (type == AT_STRING || type == AT_SD_NAME || type == AT_ID)
-        return declare();
-    if (type != AT_DATA_TYPE && type != AT_SD_DATA_TYPE)
-        return;
-    mention &given = known.stanza().data_type;
-    given.at = see.value_place();
-    given.text = see.value();
-    given.source = line.raw;
-    bool odd = compiler.data_type() == VX_UNKNOWN || given.text == "SBS";
-    if (type == AT_SD_DATA_TYPE && odd && compiler.run_makes_value())
-        known.run.odd_types.push_back(given);
-}
-
-/* Text that is not a number does not count as an Id; there is another warning for it. */
-void recovery::declare() {
-    std::string_view attr = see.attr().ta_name;
-    int *line_of_first = nullptr;
-    int *earlier = nullptr;
-    if (see.attr().ta_type == AT_ID) {
-        number n(see.value(), 0);
-        if (n.read == 0)
-            return;
-        line_of_first = &known.declared.ids[index_of(known.kind)].line_of(static_cast<vx_uint32_t>(n.value));
-        earlier = &known.declared.earlier_id;
-    } else if ((attr == "Name" || attr == "ElementName") && known.kind != SC_RESOURCE_CLASS) {
-        line_of_first = &known.declared.names[index_of(known.kind)].line_of(see.value());
-        earlier = &known.declared.earlier_name;
-    } else {
-        return;
-    }
-    *earlier = *line_of_first;
-    if (*line_of_first == 0)
-        *line_of_first = line.number;
-}
-
-/* Gives the compiler a text instead of the current line, of which an error has been reported. */
-void recovery::take_quietly(std::string_view text, size_t added) {
-    try {
-        compiler.take_attribute(line.replaced(text, added));
-        note_given();
-        if (compiler.latest().attr != nullptr && !known.stanza().misplaced)
-            note_value();
-    } catch (const fatal_exit &) {
-        const table_attrs *attr = compiler.latest().attr;
-        note_refused(attr == nullptr ? std::nullopt : std::optional(attr->ta_type));
-    }
 }
 
 } // namespace check

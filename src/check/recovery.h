@@ -53,13 +53,6 @@ private:
     void lose_header(const kind_set &kinds);
     void break_if_incomplete(int kind);
 
-    /* Attributes that have been taken (recovery.cpp). */
-    void note_given();
-    void note_refused(const std::optional<int> &attr_type);
-    void note_value();
-    void declare();
-    void take_quietly(std::string_view text, size_t added);
-
     /* Headers (recover_header.cpp). */
     bool loses_index(int next_kind) const;
     void open_stanza(int kind, bool broken);
@@ -75,6 +68,14 @@ private:
     void lose_stanza();
 
     /* Attribute lines (recover_attribute.cpp). */
+    void note_given();
+    void note_mapping_or_variable_class(bool first);
+    void note_value();
+    void note_data_type();
+    void declare_name();
+    void declare_id();
+    void note_refused(const std::optional<int> &attr_type);
+    void take_quietly(std::string_view text, size_t added);
     void recover_attribute(const fatal_exit &failure);
     void settle_split();
     language::guess header_meant(const fatal_exit &failure) const;

@@ -25,11 +25,11 @@ struct view {
         return line.part_of(compiler.latest(), offset, length);
     }
     bool is_quoted() const {
-        size_t begin = value_place().column - 1;
+        size_t begin = line.column_of(compiler.latest().value) - 1;
         return begin > 0 && line.raw[begin - 1] == '"';
     }
     std::string_view value() const {
-        return line.at(value_place());
+        return line.raw.substr(line.column_of(compiler.latest().value) - 1, compiler.latest().length);
     }
     /* The text after the value, if it is a comment without a blank before it, which may have been meant as text. */
     std::string_view comment_at_value() const {

@@ -286,6 +286,8 @@ watchers::watchers(const warning_set &wanted, findings &found) {
                 of_value[type].push_back(made.warning.get());
         all.push_back(std::move(made.warning));
     }
+    for (size_t type = 0; type < AT_COUNT; ++type)
+        looks_at[type] = !of_value[type].empty() || !of_event[ON_NUMBER].empty();
 }
 
 } // namespace check

@@ -22,10 +22,12 @@ void watchers::odd_numbers(const view &see) const {
                 each->number(see, part);
 }
 
-void watchers::attribute(const view &see) const {
-    if (!of_event[ON_QUOTED_VALUE].empty() && see.is_quoted())
-        for (watcher *each : of_event[ON_QUOTED_VALUE])
-            each->quoted_value(see);
+void watchers::quoted(const view &see) const {
+    for (watcher *each : of_event[ON_QUOTED_VALUE])
+        each->quoted_value(see);
+}
+
+void watchers::accepted(const view &see) const {
     if (see.known.stanza().misplaced &&
         see.attr().ta_type != AT_SD_DATA_TYPE) /* whichever attribute or element it belongs to, its type is unknown */
         return;

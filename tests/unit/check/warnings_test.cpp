@@ -27,6 +27,23 @@ TEST(Warnings, AreSilentWhenSwitchedOff) {
     EXPECT_EQ(found_in::findings_in(source, wanted).size(), 1u);
 }
 
+/* Names and Ids are remembered for these only. */
+TEST(Warnings, RememberNamesAndIdsIfWantedAlone) {
+    std::string source = CLASS + persistent("A", "0", "UInt32") + persistent("A", "0", "UInt32");
+    source.insert(source.find("ClassTo"), "\tLocator=A\n");
+    auto found_with = [&](check::warning_id id) {
+        check::warning_set wanted = {};
+        wanted[id] = true;
+        codes all;
+        for (const check::finding &each : found_in::findings_in(source, wanted))
+            all.push_back(found_in::shown(each));
+        return all;
+    };
+    EXPECT_EQ(found_with(check::UNKNOWN_LOCATOR), codes());
+    EXPECT_EQ(found_with(check::SAME_NAME), codes{"S506 25:7+1"});
+    EXPECT_EQ(found_with(check::SAME_ID), codes{"S507 28:5+1"});
+}
+
 TEST(Warnings, AreExplainedByTheDocumentAsTheRegistryDoes) {
     std::map<std::string, std::string> document = messages_document::sections();
     for (const check::warning &row : check::warnings) {

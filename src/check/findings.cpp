@@ -55,12 +55,27 @@ finding *findings::waiting_error(message_id id, int line) {
     return found == waiting.end() ? nullptr : &found->found;
 }
 
+/* Sorts their positions first, because it takes long to move a finding. */
 void findings::sort() {
-    auto before = [](const entry &a, const entry &b) {
-        return std::pair(a.found.at.line, !a.found.error) < std::pair(b.found.at.line, !b.found.error);
+    struct position {
+        auto operator<=>(const position &) const = default;
+
+        int line;
+        bool is_warning;
+        size_t index; /* among the waiting ones: equal findings stay in their order */
     };
-    if (!std::is_sorted(waiting.begin(), waiting.end(), before))
-        std::stable_sort(waiting.begin(), waiting.end(), before);
+    std::vector<position> order;
+    order.reserve(waiting.size());
+    for (const entry &each : waiting)
+        order.push_back({each.found.at.line, !each.found.error, order.size()});
+    if (std::is_sorted(order.begin(), order.end()))
+        return;
+    std::sort(order.begin(), order.end());
+    std::vector<entry> sorted;
+    sorted.reserve(waiting.size());
+    for (const position &each : order)
+        sorted.push_back(std::move(waiting[each.index]));
+    waiting = std::move(sorted);
 }
 
 void findings::hand_over(entry &each) {
@@ -74,6 +89,7 @@ void findings::make_room() {
         return;
     sort();
     std::vector<entry> kept;
+    kept.reserve(waiting.size());
     for (size_t i = 0; i < waiting.size(); ++i) {
         entry &each = waiting[i];
         bool is_open = each.id != WARNING_COUNT && !each.retracted && may_retract(each.id, each.found.at.line);

@@ -52,7 +52,7 @@ public:
     static constexpr std::array types = {AT_STRING};
 
     void value(const view &see) override {
-        std::string_view name = see.attr().ta_name;
+        std::string_view name = name_of(see.attr());
         if (name != "Expression" && name != "ReArmExpression")
             return;
         std::optional<lone_character> lone = lone_in(see.value());

@@ -27,7 +27,7 @@ public:
     static constexpr std::array types = {AT_STRING, AT_UINT16};
 
     void value(const view &see) override {
-        std::string_view name = see.attr().ta_name;
+        std::string_view name = name_of(see.attr());
         if (name == EXPRESSION)
             has_expression = true;
         if (name == REARM)
@@ -68,7 +68,7 @@ public:
 
     void value(const view &see) override {
         constexpr vx_uint16_t NO_GROUP = 255;
-        std::string_view name = see.attr().ta_name;
+        std::string_view name = name_of(see.attr());
         if (name == "GroupName") {
             group_name = number_in(see);
             name_line.at = see.name_place();
@@ -126,7 +126,7 @@ public:
     static constexpr std::array types = {AT_UINT16};
 
     void value(const view &see) override {
-        std::string_view name = see.attr().ta_name;
+        std::string_view name = name_of(see.attr());
         if (name == "ObservationInterval")
             observation = interval(number_in(see), see.value_mention());
         else if (name == "ReportingInterval")
@@ -162,7 +162,7 @@ public:
             return;
         if (see.attr().ta_type == AT_ID && (check::number(see.value(), 0).value & CLASS_BIT) != 0)
             id = see.value_mention();
-        else if (std::string_view(see.attr().ta_name) == "VariableClass")
+        else if (name_of(see.attr()) == "VariableClass")
             in_variable_class = true;
     }
     void stanza_end(const view &see, int) override {

@@ -55,7 +55,7 @@ public:
 
     void value(const view &see) override {
         int kind = see.known.kind;
-        std::string_view attr = see.attr().ta_name;
+        std::string_view attr = name_of(see.attr());
         bool is_name = attr == "Name" || attr == "ElementName" || attr == "VariableClass";
         if (!is_name || kind == SC_RESOURCE_CLASS || (attr == "VariableClass" && kind != SC_RESOURCE_VARIABLE_CLASS))
             return;

@@ -74,7 +74,7 @@ public:
     static constexpr std::array types = {AT_STRING};
 
     void value(const view &see) override {
-        if (std::string_view(see.attr().ta_name) != "VariableClass")
+        if (name_of(see.attr()) != "VariableClass")
             return;
         if (see.known.kind == SC_RESOURCE_VARIABLE_CLASS) {
             defined.line_of(see.value()) = see.line.number;
@@ -126,7 +126,7 @@ public:
     static constexpr std::array types = {AT_STRING};
 
     void value(const view &see) override {
-        if (std::string_view(see.attr().ta_name) != "VariableClass")
+        if (name_of(see.attr()) != "VariableClass")
             return;
         bool defines = see.known.kind == SC_RESOURCE_VARIABLE_CLASS;
         int &first = (defines ? defined_lines : used).line_of(see.value());

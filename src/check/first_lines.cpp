@@ -7,6 +7,12 @@
 
 namespace check {
 
+namespace {
+
+constexpr size_t FEWEST_SLOTS = 64;
+
+} // namespace
+
 size_t first_lines::slot_of(std::string_view text, unsigned tag) const {
     size_t mask = slots.size() - 1;
     size_t at = tag & mask;
@@ -17,8 +23,7 @@ size_t first_lines::slot_of(std::string_view text, unsigned tag) const {
 }
 
 void first_lines::grow() {
-    constexpr size_t FEWEST = 64;
-    std::vector<slot> old(std::max(FEWEST, 2 * slots.size()), slot{0, 0});
+    std::vector<slot> old(std::max(FEWEST_SLOTS, 2 * slots.size()), slot{0, 0});
     std::swap(old, slots);
     size_t mask = slots.size() - 1;
     for (const slot &each : old) {
@@ -54,12 +59,16 @@ std::vector<std::string_view> first_lines::all() const {
     return names;
 }
 
+/* The time that this takes is proportional to the texts, not to the most that there ever were. */
 void first_lines::clear() {
     if (entries.empty())
         return;
+    bool sparse = slots.size() > FEWEST_SLOTS * entries.size();
+    slots.assign(sparse ? 0 : slots.size(), slot{0, 0});
+    if (sparse)
+        slots.shrink_to_fit();
     texts.clear();
     entries.clear();
-    std::fill(slots.begin(), slots.end(), slot{0, 0});
 }
 
 } // namespace check

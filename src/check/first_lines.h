@@ -2,8 +2,6 @@
 #ifndef CDGEN_CHECK_FIRST_LINES_H
 #define CDGEN_CHECK_FIRST_LINES_H
 
-#include "vx.h"
-
 #include <cstddef>
 #include <functional>
 #include <limits>
@@ -19,18 +17,12 @@ public:
     int &line_of(std::string_view text) {
         return line_of(text, tag_of(text));
     }
-    int &line_of(vx_uint32_t number) {
-        return line_of(text_of_number(number), tag_of(number));
-    }
     bool has(std::string_view text) const {
         return find(text) != 0;
     }
-    /* The line of a text or a number; 0 if it is not known. */
+    /* The line of a text; 0 if it is not known. */
     int find(std::string_view text) const {
         return find(text, tag_of(text));
-    }
-    int find(vx_uint32_t number) const {
-        return find(text_of_number(number), tag_of(number));
     }
     /* All texts, in the order in which they came; valid until the next one is added. */
     std::vector<std::string_view> all() const;
@@ -51,16 +43,6 @@ private:
     static unsigned tag_of(std::string_view text) {
         constexpr int LOWER = std::numeric_limits<size_t>::digits - std::numeric_limits<unsigned>::digits;
         return static_cast<unsigned>(std::hash<std::string_view>()(text) >> LOWER);
-    }
-    /* Numbers mostly ascend, so the slots of eight of them are close together. If the slots of more were adjacent, the
-     * search for a missing number would take long. */
-    static unsigned tag_of(vx_uint32_t number) {
-        constexpr unsigned NEAR_BITS = 3, MIX = 0x9E3779B1, SHIFT = 15;
-        unsigned mixed = (number >> NEAR_BITS) * MIX;
-        return ((mixed ^ mixed >> SHIFT) << NEAR_BITS) | (number & ((1u << NEAR_BITS) - 1));
-    }
-    static std::string_view text_of_number(const vx_uint32_t &number) {
-        return {reinterpret_cast<const char *>(&number), sizeof number};
     }
     int &line_of(std::string_view text, unsigned tag);
     int find(std::string_view text, unsigned tag) const;

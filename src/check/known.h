@@ -5,6 +5,7 @@
 
 #include "check/check.h"
 #include "check/first_lines.h"
+#include "check/number_lines.h"
 #include "language/names.h"
 
 #include <algorithm>
@@ -130,7 +131,7 @@ struct declarations {
     bool keeps_names;
     bool keeps_ids;
     std::array<first_lines, SC_COUNT> names;
-    std::array<first_lines, SC_COUNT> ids;
+    std::array<number_lines, SC_COUNT> ids;
     int earlier_name = 0; /* the line that gave the current line's name first; 0: none did */
     int earlier_id = 0;
 };

@@ -107,10 +107,8 @@ void recovery::declare_id() {
     number n(see.value(), 0);
     if (n.read == 0)
         return;
-    int &first = known.declared.ids[index_of(known.kind)].line_of(static_cast<vx_uint32_t>(n.value));
-    known.declared.earlier_id = first;
-    if (first == 0)
-        first = line.number;
+    number_lines &ids = known.declared.ids[index_of(known.kind)];
+    known.declared.earlier_id = ids.add(static_cast<vx_uint32_t>(n.value), line.number);
 }
 
 void recovery::note_refused(const std::optional<int> &attr_type) {

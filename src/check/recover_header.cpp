@@ -32,7 +32,7 @@ void forget_declarations(declarations &declared, int next_kind, bool begins_run,
         return;
     for (first_lines &names : declared.names)
         names.clear();
-    for (first_lines &ids : declared.ids)
+    for (number_lines &ids : declared.ids)
         ids.clear();
 }
 

@@ -1,0 +1,35 @@
+/* number_lines.h: numbers, each with the line that gave it first. There may be very many. */
+#ifndef CDGEN_CHECK_NUMBER_LINES_H
+#define CDGEN_CHECK_NUMBER_LINES_H
+
+#include "vx.h"
+
+#include <cstddef>
+#include <vector>
+
+namespace check {
+
+class number_lines {
+public:
+    /* The line that gave a number first. If none did, returns 0 and notes this line, which is not 0. */
+    int add(vx_uint32_t number, int line);
+    /* The line of a number; 0 if it is not known. */
+    int find(vx_uint32_t number) const;
+    void clear();
+
+private:
+    struct slot {
+        vx_uint32_t number;
+        int line; /* 0: the slot is free */
+    };
+
+    size_t slot_of(vx_uint32_t number) const;
+    void grow();
+
+    size_t count = 0;
+    std::vector<slot> slots; /* at most half of them are taken */
+};
+
+} // namespace check
+
+#endif

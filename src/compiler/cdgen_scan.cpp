@@ -2,33 +2,15 @@
 
 #include "compiler/cdgen_scan.h"
 
-#include <cstring>
+#include "compiler/cdgen_words.h"
+
+#include <algorithm>
 
 #if defined(__SSE2__)
 #include <emmintrin.h>
 #endif
 
 namespace {
-
-constexpr size_t WORD = sizeof(uint64_t);
-
-/* A word whose bytes are all the same. */
-constexpr uint64_t all(char byte) {
-    return 0x0101010101010101 * static_cast<unsigned char>(byte);
-}
-
-/* The highest bit of each byte that is 0. The addition carries from no byte into the next. */
-constexpr uint64_t zero_bytes(uint64_t word) {
-    constexpr uint64_t low_bits = all(0x7F);
-    return ~(((word & low_bits) + low_bits) | word | low_bits);
-}
-
-/* The first byte is the lowest. */
-uint64_t load_word(const char *bytes) {
-    uint64_t word = 0;
-    memcpy(&word, bytes, sizeof word);
-    return std::endian::native == std::endian::little ? word : __builtin_bswap64(word);
-}
 
 /* The highest bits of eight bytes, next to each other. */
 constexpr uint64_t gathered(uint64_t high_bits) {
@@ -108,26 +90,19 @@ block_bits scan_block(const char *bytes) {
 #endif
 
 [[gnu::noinline]] void scanned_places::scan(const char *buffer, size_t size) {
-    blocks = size / SCAN_BLOCK + 1;
-    for (size_t block = 0; block < blocks; ++block) {
+    for (size_t block = 0; block <= size / SCAN_BLOCK; ++block) {
         block_bits found = scan_block(buffer + block * SCAN_BLOCK);
-        newlines[block] = found.newlines;
+        newlines.words[block] = found.newlines;
         marks.words[block] = found.marks;
     }
-    uint64_t end = uint64_t{1} << size % SCAN_BLOCK;
-    newlines[blocks - 1] &= end - 1;
-    marks.words[blocks - 1] = (marks.words[blocks - 1] & (end - 1)) | end;
-    blocks_listed = 0;
-    list_more();
+    end_at(size);
 }
 
-bool scanned_places::list_more() {
-    uint32_t *next = listed.data();
-    for (const uint32_t *full = next + MOST_LISTED - SCAN_BLOCK; next <= full && blocks_listed < blocks;
-         ++blocks_listed)
-        for (uint64_t rest = newlines[blocks_listed]; rest != 0; rest &= rest - 1)
-            *next++ = static_cast<uint32_t>(blocks_listed * SCAN_BLOCK) + static_cast<uint32_t>(std::countr_zero(rest));
-    *next = NO_NEWLINE;
-    taken = 0;
-    return next != listed.data();
+void scanned_places::end_at(size_t size) {
+    size_t last = size / SCAN_BLOCK;
+    uint64_t end = uint64_t{1} << size % SCAN_BLOCK;
+    newlines.words[last] &= end - 1;
+    std::fill_n(&newlines.words[last + 1], FAR_BLOCKS - 1, 0);
+    newlines.words[last + FAR_BLOCKS] = 1;
+    marks.words[last] = (marks.words[last] & (end - 1)) | end;
 }

@@ -10,6 +10,7 @@
 
 constexpr size_t SCAN_BLOCK = 64;     /* bytes; one word has their bits */
 constexpr size_t SCAN_BUFFER = 65536; /* bytes of the largest buffer */
+constexpr size_t FAR_BLOCKS = 5;      /* blocks after it, for places after its end */
 
 /* The bits of a block, that of its first byte the lowest. */
 struct block_bits {
@@ -24,56 +25,46 @@ block_bits scan_block_by_words(const char *bytes);
 /* A set of places in a buffer. */
 class place_set {
 public:
-    /* The first place in the set that is not before this one. There must be such a place. */
-    size_t first_from(size_t place) const {
+    /* How far it is from a place to the first place in the set that is not before it. There must be such a place. */
+    size_t distance_from(size_t place) const {
         size_t block = place / SCAN_BLOCK;
         if (uint64_t rest = words[block] >> place % SCAN_BLOCK)
-            return place + static_cast<size_t>(std::countr_zero(rest));
+            return lowest_bit(rest);
         do
             ++block;
         while (words[block] == 0);
-        return block * SCAN_BLOCK + static_cast<size_t>(std::countr_zero(words[block]));
+        return block * SCAN_BLOCK + lowest_bit(words[block]) - place;
     }
 
 private:
     friend struct scanned_places;
 
-    std::array<uint64_t, SCAN_BUFFER / SCAN_BLOCK + 1> words;
+    static size_t lowest_bit(uint64_t word) {
+        return static_cast<unsigned>(std::countr_zero(word));
+    }
+
+    std::array<uint64_t, SCAN_BUFFER / SCAN_BLOCK + 1 + FAR_BLOCKS> words;
 };
 
 /* The places of a buffer. */
 struct scanned_places {
-    static constexpr uint32_t NO_NEWLINE = 0xFFFFFFFF;
-
     /* Those of an empty buffer. */
     scanned_places() {
-        listed[0] = NO_NEWLINE;
-        marks.words[0] = 1;
+        newlines.words[0] = marks.words[0] = 0;
+        end_at(0);
     }
 
     /* The buffer has at most SCAN_BUFFER bytes, and SCAN_BLOCK more that may be read. */
     void scan(const char *buffer, size_t size);
 
-    /* The first newline that is listed and has not been taken. NO_NEWLINE, which cannot be taken, if there is none. */
-    size_t newline() const {
-        return listed[taken];
-    }
-    void take_newline() {
-        ++taken;
-    }
-    /* Lists the next newlines when all listed ones have been taken. Returns false if there are none. */
-    bool list_more();
+    place_set newlines; /* the last place is no newline, but more than FAR bytes after the end of the buffer */
+    place_set marks;    /* the last place is the end of the buffer */
 
-    place_set marks; /* the end of the buffer is the last one, so that every search ends */
+    static constexpr size_t FAR = (FAR_BLOCKS - 1) * SCAN_BLOCK;
 
 private:
-    static constexpr size_t MOST_LISTED = 1024;
-
-    std::array<uint64_t, SCAN_BUFFER / SCAN_BLOCK + 1> newlines; /* by block */
-    size_t blocks = 0;
-    size_t blocks_listed = 0;
-    size_t taken = 0;                             /* of the listed newlines */
-    std::array<uint32_t, MOST_LISTED + 1> listed; /* their places, and then NO_NEWLINE */
+    /* Nothing is found from this place on but the last places, which end every search. */
+    void end_at(size_t size);
 };
 
 #endif

@@ -42,7 +42,7 @@ bool refill(cdgen &cx) {
     source.end = begun + n;
     memset(source.buffer.data() + source.end, 0, SCAN_BLOCK);
     source.places.scan(source.buffer.data(), source.end);
-    source.mark = source.places.marks.first_from(0);
+    source.mark = source.places.marks.distance_from(0);
     return n > 0;
 }
 
@@ -52,9 +52,8 @@ source_line whole_line(cdgen &cx, size_t length) {
     size_t place = source.pos;
     char *begin = source.buffer.data() + place;
     if (source.mark < place)
-        source.mark = source.places.marks.first_from(place);
+        source.mark = place + source.places.marks.distance_from(place);
     source.pos += length + 1;
-    source.places.take_newline();
     ++cx.source.linenum;
     return {begin,
             begin + length,
@@ -73,18 +72,35 @@ source_line cut_line(cdgen &cx, size_t length) {
     begin[length] = '\0';
     source.pos += length;
     ++cx.source.linenum;
-    size_t mark = source.places.marks.first_from(place) - place;
+    size_t mark = source.places.marks.distance_from(place);
     return {begin, begin + length, begin + length, begin + std::min(mark, length), &source.places.marks, place};
 }
 
-/* The line's first mark from p on; its end if there is none. */
-char *next_mark(const source_line &line, const char *p) {
-    size_t mark = line.marks->first_from(line.place + static_cast<size_t>(p - line.begin)) - line.place;
-    return line.begin + std::min(mark, static_cast<size_t>(line.end - line.begin));
+static_assert(scanned_places::FAR >= LINE_MAX_CHARS, "the last place would be taken for a newline");
+
+constexpr uint64_t bit_of(char c) {
+    return uint64_t{1} << c;
+}
+
+/* True for the characters of a set, of which the last one is the highest. */
+bool is_one_of(uint64_t characters, char last, char c) {
+    auto code = static_cast<unsigned char>(c);
+    return code <= last && (characters >> code & 1) != 0;
 }
 
 bool is_blank(char c) {
-    return static_cast<unsigned char>(c) <= ' ' && (c == ' ' || c == '\t');
+    return is_one_of(bit_of(' ') | bit_of('\t'), ' ', c);
+}
+
+/* At the end of a text. */
+bool is_left_out(char c) {
+    return is_one_of(bit_of(' ') | bit_of('\t') | bit_of('#'), '#', c);
+}
+
+/* The line's first mark from p on; its end if there is none. */
+char *next_mark(const source_line &line, char *p) {
+    size_t distance = line.marks->distance_from(line.place + static_cast<size_t>(p - line.begin));
+    return p + std::min(distance, static_cast<size_t>(line.end - p));
 }
 
 /* Where the text of a line that has marks ends: at its newline, its comment, or its NUL. Null for a line without text:
@@ -137,11 +153,9 @@ void take_source(cdgen &cx, std::string_view bytes) {
 
 source_line next_line(cdgen &cx) {
     for (source_file &source = cx.source.cdb_fp;;) {
-        size_t length = source.places.newline() - source.pos;
+        size_t length = source.places.newlines.distance_from(source.pos);
         if (length < LINE_MAX_CHARS)
             return whole_line(cx, length);
-        if (source.places.newline() == scanned_places::NO_NEWLINE && source.places.list_more())
-            continue;
         if (source.end - source.pos >= LINE_MAX_CHARS)
             return cut_line(cx, LINE_MAX_CHARS);
         if (!refill(cx) && source.end > 0)
@@ -155,10 +169,14 @@ attr_text text_of(const source_line &line) {
     char *begin = line.begin;
     while (is_blank(*begin))
         ++begin;
-    char *end = line.mark < line.end ? end_by_marks(line, begin) : begin < line.end ? line.end : nullptr;
+    char *end = line.end;
+    if (line.mark < end)
+        end = end_by_marks(line, begin);
+    else if (begin >= end)
+        end = nullptr;
     if (end == nullptr)
         return {line.begin, begin, nullptr};
-    while (is_blank(end[-1]) || end[-1] == '#') /* there is text in front */
+    while (is_left_out(end[-1])) /* there is text in front */
         --end;
     *end = '\0';
     return {line.begin, begin, end};

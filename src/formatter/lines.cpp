@@ -27,7 +27,7 @@ public:
         attr_text text = ::text_of({.begin = begin,
                                     .end = begin + whole.size(),
                                     .read_end = begin + whole.size() + 1,
-                                    .mark = begin + places.marks.first_from(0),
+                                    .mark = begin + places.marks.distance_from(0),
                                     .marks = &places.marks,
                                     .place = 0});
         if (text.end == nullptr)

@@ -55,17 +55,13 @@ void expect_places_of(const std::string &padded, size_t size) {
     auto places = std::make_unique<scanned_places>();
     places->scan(padded.data(), size);
     std::string_view bytes(padded.data(), size);
-    for (size_t from = 0; from <= size; ++from)
-        ASSERT_EQ(places->marks.first_from(from), first_in(bytes, from, is_mark));
-    for (size_t from = 0; from <= size; from = places->newline() + 1) {
-        if (from > 0)
-            places->take_newline();
-        if (places->newline() == scanned_places::NO_NEWLINE)
-            places->list_more();
-        size_t expected = first_in(bytes, from, [](char c) { return c == '\n'; });
-        ASSERT_EQ(places->newline(), expected == size ? scanned_places::NO_NEWLINE : expected);
-        if (expected == size)
-            return;
+    for (size_t from = 0; from <= size; ++from) {
+        ASSERT_EQ(from + places->marks.distance_from(from), first_in(bytes, from, is_mark));
+        size_t newline = first_in(bytes, from, [](char c) { return c == '\n'; });
+        if (newline < size)
+            ASSERT_EQ(from + places->newlines.distance_from(from), newline);
+        else
+            ASSERT_GT(from + places->newlines.distance_from(from), size + scanned_places::FAR);
     }
 }
 
@@ -97,7 +93,7 @@ TEST(Scan, SearchesEndAtTheEndOfTheBuffer) {
         expect_places_of(random_bytes(random, size, 50) + std::string(SCAN_BLOCK, '\n'), size);
 }
 
-TEST(Scan, MoreNewlinesThanAreListedAtOnce) {
+TEST(Scan, NothingButNewlines) {
     constexpr size_t SIZE = 3000;
     expect_places_of(std::string(SIZE, '\n') + std::string(SCAN_BLOCK, '#'), SIZE);
 }
@@ -109,8 +105,8 @@ TEST(Scan, FullBuffer) {
 
 TEST(Scan, EmptyFromTheStart) {
     auto places = std::make_unique<scanned_places>();
-    EXPECT_EQ(places->newline(), scanned_places::NO_NEWLINE);
-    EXPECT_EQ(places->marks.first_from(0), 0U);
+    EXPECT_GT(places->newlines.distance_from(0), scanned_places::FAR);
+    EXPECT_EQ(places->marks.distance_from(0), 0U);
 }
 
 } // namespace

@@ -77,10 +77,11 @@ void begin_plain_stanza(cdgen &cx) {
     cx.sd.forget_owner();
 }
 
-void begin_stanza(cdgen &cx, std::string_view name) {
-    cx.framing.table_id = set_table_id(name);
+void begin_stanza(cdgen &cx, const attr_text &text) {
+    *text.end = '\0';
+    cx.framing.table_id = set_table_id({text.name, static_cast<size_t>(text.end - text.name)});
     if (cx.framing.table_id < 0)
-        source_error(cx, MSG_UNKNOWN_STANZA, name.data());
+        source_error(cx, MSG_UNKNOWN_STANZA, text.name);
     cx.framing.prev_scp = cx.framing.scp;
     cx.framing.scp = cx.framing.curr_sd_scp = &sc_tables[static_cast<size_t>(cx.framing.table_id)];
     cx.framing.state = &state_of(cx, cx.framing.scp);
@@ -95,7 +96,7 @@ void begin_stanza(cdgen &cx, std::string_view name) {
 
 void take_line(cdgen &cx, const attr_text &text) {
     if (text.name == text.line)
-        begin_stanza(cx, {text.name, static_cast<size_t>(text.end - text.name)});
+        begin_stanza(cx, text);
     else if (cx.framing.table_id < 0)
         source_error(cx, MSG_NO_STANZA);
     else
@@ -125,7 +126,7 @@ void cache_input_data(cdgen &cx, const char *filename) {
         source_line line = next_line(cx);
         if (line.begin == nullptr)
             break;
-        attr_text text = text_of(line);
+        attr_text text = find_text(line);
         if (text.end != nullptr)
             take_line(cx, text);
     }

@@ -4,7 +4,8 @@
 
 #include "compiler/cdgen_attr.h"
 
-/* Takes a header, if the line does not begin with a blank, or an attribute line, which is modified in place. */
+/* Takes a header, if the line does not begin with a blank, or an attribute line. Writes a NUL at the text's end and may
+ * modify it. */
 void take_line(cdgen &cx, const attr_text &text);
 
 #endif

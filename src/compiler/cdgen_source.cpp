@@ -165,7 +165,7 @@ source_line next_line(cdgen &cx) {
     }
 }
 
-attr_text text_of(const source_line &line) {
+attr_text find_text(const source_line &line) {
     char *begin = line.begin;
     while (is_blank(*begin))
         ++begin;
@@ -178,6 +178,12 @@ attr_text text_of(const source_line &line) {
         return {line.begin, begin, nullptr};
     while (is_left_out(end[-1])) /* there is text in front */
         --end;
-    *end = '\0';
     return {line.begin, begin, end};
+}
+
+attr_text text_of(const source_line &line) {
+    attr_text text = find_text(line);
+    if (text.end != nullptr)
+        *text.end = '\0';
+    return text;
 }

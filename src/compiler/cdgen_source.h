@@ -4,6 +4,7 @@
 
 #include "compiler/cdgen_scan.h"
 #include "language/limits.h"
+#include "language/name_pattern.h"
 
 #include <algorithm>
 #include <array>
@@ -41,9 +42,9 @@ struct source_file {
 
 struct source_reader {
     source_file cdb_fp;
-    char inbuf[LINE_MAX_CHARS + 2] = {}; /* a line that has no newline after it in the buffer */
-    int64_t linenum = 0;                 /* reads made; a line of more than LINE_MAX_CHARS takes several */
-    int linepos = 0;                     /* column, from 1 */
+    char inbuf[LINE_MAX_CHARS + SCAN_BLOCK] = {}; /* a line that has no newline after it in the buffer */
+    int64_t linenum = 0;                          /* reads made; a line of more than LINE_MAX_CHARS takes several */
+    int linepos = 0;                              /* column, from 1 */
 
     /* The number as messages show it. */
     int shown_line() const {
@@ -51,7 +52,11 @@ struct source_reader {
     }
 };
 
-/* A line's text, which ends with a NUL. */
+/* So many bytes after a line's text may be read, whatever they are: names and values are read by words. */
+constexpr size_t READ_AHEAD = language::name_pattern::WIDTH;
+static_assert(READ_AHEAD < SCAN_BLOCK, "the read buffer and inbuf have SCAN_BLOCK bytes more than a line");
+
+/* A line's text. The byte at its end may be overwritten, and READ_AHEAD bytes from there on may be read. */
 struct attr_text {
     char *line; /* where the line begins */
     char *name; /* the first character that is not a blank */
@@ -83,6 +88,9 @@ source_line next_line(cdgen &cx);
 
 /* A line's text: the line without its comment, and without trailing blanks and hash signs, even quoted ones. Its end is
  * null for a line without text. */
+attr_text find_text(const source_line &line);
+
+/* The same; writes a NUL at the text's end. */
 attr_text text_of(const source_line &line);
 
 #endif

@@ -74,7 +74,7 @@ void stepwise_compiler::take_source(std::string_view bytes) {
 void stepwise_compiler::take_lines(std::string_view lines) {
     cx.source.cdb_fp.memory = lines;
     for (source_line line = next_line(); line.begin != nullptr; line = next_line())
-        if (attr_text text = text_of(line); text.end != nullptr)
+        if (attr_text text = find_text(line); text.end != nullptr)
             take_line(text);
 }
 

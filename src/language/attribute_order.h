@@ -4,7 +4,6 @@
 #define CDGEN_LANGUAGE_ATTRIBUTE_ORDER_H
 
 #include "language/catalogue.h"
-#include "language/same_bytes.h"
 
 #include <array>
 
@@ -19,12 +18,11 @@ public:
     }
 
     /* The attribute that came next in the previous stanza, if the line begins with its name and an equals sign; it is
-     * then noted as this stanza's latest attribute. Otherwise null. */
-    const table_attrs *expected(const srtable_ctrl &kind, std::string_view line) {
+     * then noted as this stanza's latest attribute. Otherwise null. name_pattern::WIDTH bytes of the line are read. */
+    const table_attrs *expected(const srtable_ctrl &kind, const char *line) {
         std::uint8_t position = next[latest];
         const table_attrs &attr = kind.sc_attrs[position];
-        std::size_t length = attr.ta_length;
-        if (line.size() <= length || line[length] != '=' || !same_bytes(line.data(), attr.ta_name, length))
+        if (!attr.ta_pattern.begins(line))
             return nullptr;
         latest = position;
         return &attr;

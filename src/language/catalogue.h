@@ -4,6 +4,7 @@
 
 #include "cdb.h"
 #include "language/name_index.h"
+#include "language/name_pattern.h"
 
 #include <array>
 #include <span>
@@ -92,6 +93,7 @@ struct table_attrs {
     vx_uint32_t req_bit; /* the attribute's bit in req_mask or, with OPTIONAL added, in opt_mask */
     int dup_allowed;     /* true: may be given several times in one stanza */
     size_t ta_length = std::string_view(ta_name).size();
+    language::name_pattern ta_pattern{ta_name};
 };
 
 /* The differences between the four attribute kinds while their lines are parsed. */

@@ -162,6 +162,7 @@ public:
     /* Passes one attribute line to the parser alone. The message of a failure may refer to the line's text. */
     void feed(stanza_id kind, std::string_view text) {
         line = text;
+        line.reserve(text.size() + READ_AHEAD);
         save_attr(cx, line.data(), kind);
     }
     ending feeding(stanza_id kind, std::string_view text) {

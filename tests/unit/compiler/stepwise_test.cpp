@@ -29,6 +29,7 @@ class Stepwise : public testing::Test {
 protected:
     void take(std::string text) {
         size_t blanks = text.find_first_not_of('\t');
+        text.reserve(text.size() + READ_AHEAD);
         compiler.take_line({text.data(), text.data() + blanks, text.data() + text.size()});
     }
     /* The message of a line that fails, NO_MESSAGE if it does not. */

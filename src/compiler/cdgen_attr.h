@@ -4,21 +4,18 @@
 
 #include "compiler/cdgen_context.h"
 
-/* A checked attribute line. */
+/* A checked attribute line of the current stanza. */
 struct attr_line {
     cdgen &cx;
-    const srtable_ctrl &scp; /* the stanza's kind */
-    stanza_state &state;
-    char *record; /* the kind's staging record */
     const table_attrs &attr;
     char *value; /* not empty; may be taken apart */
-    size_t length = strlen(value);
+    size_t length;
 };
 
-/* Takes one attribute line of a stanza of that kind, which fills that staging record. */
-void save_attr_line(cdgen &cx, const attr_text &text, const srtable_ctrl &scp, stanza_state &state, char *record);
+/* Takes one attribute line of the current stanza. */
+void save_attr_line(cdgen &cx, attr_text text);
 
-/* Converts the value and stores it, by the attribute's type. */
+/* Converts the value of a line and stores it, by the attribute's type. */
 void store_value(const attr_line &line);
 
 #endif

@@ -16,7 +16,7 @@ namespace {
 /* ---- Fields of staging records -------------------------------------------------------------------------------- */
 
 char *field_of(const attr_line &line) {
-    return line.record + line.attr.ta_offset;
+    return line.cx.framing.record + line.attr.ta_offset;
 }
 
 template <class Value> Value load(const char *from) {
@@ -38,11 +38,11 @@ vx_int64_t integer(const attr_line &line, std::string_view text) {
 }
 
 vx_data_type_t data_type(const attr_line &line) {
-    return load<vx_data_type_t>(line.record + line.scp.dt_offset);
+    return load<vx_data_type_t>(line.cx.framing.record + line.cx.framing.scp->dt_offset);
 }
 
 tbl *strings_of(const attr_line &line) {
-    tbl *strings = sc_str_tbl(line.cx, line.scp);
+    tbl *strings = sc_str_tbl(line.cx, *line.cx.framing.scp);
     if (strings == nullptr)
         source_error(line.cx, MSG_NO_STRING_TABLE);
     return strings;
@@ -157,7 +157,7 @@ void store_variety(const attr_line &line) {
     std::optional<bounds> given = split_bounds(line);
     if (!given)
         source_error(line.cx, MSG_INVALID_VARIETY);
-    tbl *varieties = sc_vty_tbl(line.cx, line.scp);
+    tbl *varieties = sc_vty_tbl(line.cx, *line.cx.framing.scp);
     auto list = load<vx_uint32_t>(field_of(line));
     size_t at = next_entry(line.cx, varieties, list, &variety_list_t::vl_count, offsetof(variety_list_t, vl_values),
                            sizeof(vl_entry_t));
@@ -205,7 +205,7 @@ void store_bounds(const attr_line &line, vx_data_type_t type, vv_entry_t *entry)
 /* Adds an entry to the list at the field's offset. The entries have the owner's type, or its element type. */
 void add_valid_value(const attr_line &line) {
     cdgen &cx = line.cx;
-    tbl *lists = sc_vv_tbl(cx, line.scp);
+    tbl *lists = sc_vv_tbl(cx, *line.cx.framing.scp);
     auto list = load<vx_uint32_t>(field_of(line));
     size_t at =
         next_entry(cx, lists, list, &valid_values_t::vv_count, offsetof(valid_values_t, vv_values), sizeof(vv_entry_t));
@@ -218,7 +218,7 @@ void add_valid_value(const attr_line &line) {
 }
 
 void store_valid_value(const attr_line &line) {
-    vx_uint16_t &found = vv_found(line.cx, line.scp);
+    vx_uint16_t &found = vv_found(line.cx, *line.cx.framing.scp);
     if (!found) {
         store(field_of(line), mk_vv_sec(line.cx));
         found = 1;
@@ -230,7 +230,7 @@ void store_value_display(const attr_line &line) {
     cdgen &cx = line.cx;
     if (!cx.valid_values.vvdisp.has_value())
         source_error(cx, MSG_NO_VALID_VALUE);
-    *record_at<vx_uint16_t>(sc_vv_tbl(cx, line.scp), *cx.valid_values.vvdisp) =
+    *record_at<vx_uint16_t>(sc_vv_tbl(cx, *line.cx.framing.scp), *cx.valid_values.vvdisp) =
         static_cast<vx_uint16_t>(integer(line, value_of(line)));
 }
 
@@ -253,7 +253,7 @@ void store_default(const attr_line &line) {
     vx_data_type_t type = data_type(line);
     if (is_sd(type))
         source_error(cx, MSG_SD_DEFAULT);
-    dflt_tbl &dflt = line.state.dflt;
+    dflt_tbl &dflt = line.cx.framing.state->dflt;
     if (dflt.tbl == nullptr)
         dflt.tbl = new_dflt_values(cx, "DefaultValues");
     void *slot = alloc_tble(cx, &dflt.tbl->cells, sizeof(vx_value_t));
@@ -267,11 +267,11 @@ void store_default(const attr_line &line) {
 /* An SD-typed attribute gets its value from the run of SD stanzas that follows it. */
 void expect_sd_run(const attr_line &line, vx_data_type_t type) {
     cdgen &cx = line.cx;
-    const attr_kind &kind = *line.scp.sc_attr;
-    cx.sd.announce(reinterpret_cast<vx_value_t *>(line.record + kind.value_offset),
-                   reinterpret_cast<cdb_ref_t *>(line.record + kind.sd_offset),
-                   reinterpret_cast<vx_uint16_t *>(line.record + kind.max_sd_idx_offset), kind.sd_attr_type);
-    line.state.dflt.tbl = new_dflt_values(cx, type == VX_SD_PTR ? "VX_SD_PTR" : "VX_SD_PTR_ARRAY", type);
+    const attr_kind &kind = *line.cx.framing.scp->sc_attr;
+    cx.sd.announce(reinterpret_cast<vx_value_t *>(line.cx.framing.record + kind.value_offset),
+                   reinterpret_cast<cdb_ref_t *>(line.cx.framing.record + kind.sd_offset),
+                   reinterpret_cast<vx_uint16_t *>(line.cx.framing.record + kind.max_sd_idx_offset), kind.sd_attr_type);
+    line.cx.framing.state->dflt.tbl = new_dflt_values(cx, type == VX_SD_PTR ? "VX_SD_PTR" : "VX_SD_PTR_ARRAY", type);
 }
 
 void store_data_type(const attr_line &line) {
@@ -352,7 +352,7 @@ void store_sd_data_type(const attr_line &line) {
     cx.sd.element.sd_dt_found = 1;
     if (!cx.sd.makes_value())
         return;
-    dflt_tbl &dflt = line.state.dflt;
+    dflt_tbl &dflt = line.cx.framing.state->dflt;
     *static_cast<vx_value_t *>(alloc_tble(cx, &dflt.tbl->cells, sizeof(vx_value_t))) = {
         .val_uint32 = static_cast<vx_uint32_t>(type)};
     ++dflt.num_elems;
@@ -371,42 +371,48 @@ void refuse_sd_default(const attr_line &line) {
     source_error(line.cx, MSG_ELEMENT_DEFAULT);
 }
 
-using handler = void (*)(const attr_line &);
+using handler = void (*)(cdgen &cx, const table_attrs &attr, char *value, size_t length);
+
+/* The function as a handler. A line has four words, which a handler gets in registers. */
+template <void (*store)(const attr_line &)>
+void stored_by(cdgen &cx, const table_attrs &attr, char *value, size_t length) {
+    store({cx, attr, value, length});
+}
 
 /* By attr_type. */
 constexpr std::array<handler, AT_COUNT> handlers = {
-    store_integer<uint8_t>,     /* AT_UINT8 */
-    store_integer<vx_uint16_t>, /* AT_UINT16 */
-    store_integer<vx_uint32_t>, /* AT_UINT32 */
-    store_string,               /* AT_STRING */
-    store_class_props,          /* AT_CLASS_PROPS */
-    store_version,              /* AT_VERSION */
-    store_perm_template,        /* AT_PERM_TEMPLATE */
-    store_manager,              /* AT_MANAGER */
-    store_locator,              /* AT_LOCATOR */
-    store_integer<vx_uint32_t>, /* AT_ID */
-    store_variety,              /* AT_VARIETY */
-    store_pattr_props,          /* AT_PATTR_PROPS */
-    store_dattr_props,          /* AT_DATTR_PROPS */
-    store_action_props,         /* AT_ACTION_PROPS */
-    store_valid_value,          /* AT_VALID_VALUE */
-    store_default,              /* AT_DEFAULT_VALUE */
-    store_value_display,        /* AT_VALUE_DISPLAY */
-    store_data_type,            /* AT_DATA_TYPE */
-    store_variable_type,        /* AT_VARIABLE_TYPE */
-    store_range,                /* AT_RANGE */
-    store_default,              /* AT_INITIAL_VALUE */
-    check_sd_index,             /* AT_SD_INDEX */
-    store_sd_name,              /* AT_SD_NAME */
-    store_sd_description,       /* AT_SD_DESCRIPTION */
-    store_sd_display,           /* AT_SD_DISPLAY */
-    store_sd_data_type,         /* AT_SD_DATA_TYPE */
-    store_sd_valid_value,       /* AT_SD_VALID_VALUE */
-    store_value_display,        /* AT_SD_VALUE_DISPLAY */
-    refuse_sd_default,          /* AT_SD_DEFAULT_VALUE */
-    ignore,                     /* AT_LIST_ACTION_CLASS */
-    ignore,                     /* AT_LIST_ACTION_RSRC */
-    store_permission,           /* AT_PERMISSION */
+    stored_by<store_integer<uint8_t>>,     /* AT_UINT8 */
+    stored_by<store_integer<vx_uint16_t>>, /* AT_UINT16 */
+    stored_by<store_integer<vx_uint32_t>>, /* AT_UINT32 */
+    stored_by<store_string>,               /* AT_STRING */
+    stored_by<store_class_props>,          /* AT_CLASS_PROPS */
+    stored_by<store_version>,              /* AT_VERSION */
+    stored_by<store_perm_template>,        /* AT_PERM_TEMPLATE */
+    stored_by<store_manager>,              /* AT_MANAGER */
+    stored_by<store_locator>,              /* AT_LOCATOR */
+    stored_by<store_integer<vx_uint32_t>>, /* AT_ID */
+    stored_by<store_variety>,              /* AT_VARIETY */
+    stored_by<store_pattr_props>,          /* AT_PATTR_PROPS */
+    stored_by<store_dattr_props>,          /* AT_DATTR_PROPS */
+    stored_by<store_action_props>,         /* AT_ACTION_PROPS */
+    stored_by<store_valid_value>,          /* AT_VALID_VALUE */
+    stored_by<store_default>,              /* AT_DEFAULT_VALUE */
+    stored_by<store_value_display>,        /* AT_VALUE_DISPLAY */
+    stored_by<store_data_type>,            /* AT_DATA_TYPE */
+    stored_by<store_variable_type>,        /* AT_VARIABLE_TYPE */
+    stored_by<store_range>,                /* AT_RANGE */
+    stored_by<store_default>,              /* AT_INITIAL_VALUE */
+    stored_by<check_sd_index>,             /* AT_SD_INDEX */
+    stored_by<store_sd_name>,              /* AT_SD_NAME */
+    stored_by<store_sd_description>,       /* AT_SD_DESCRIPTION */
+    stored_by<store_sd_display>,           /* AT_SD_DISPLAY */
+    stored_by<store_sd_data_type>,         /* AT_SD_DATA_TYPE */
+    stored_by<store_sd_valid_value>,       /* AT_SD_VALID_VALUE */
+    stored_by<store_value_display>,        /* AT_SD_VALUE_DISPLAY */
+    stored_by<refuse_sd_default>,          /* AT_SD_DEFAULT_VALUE */
+    stored_by<ignore>,                     /* AT_LIST_ACTION_CLASS */
+    stored_by<ignore>,                     /* AT_LIST_ACTION_RSRC */
+    stored_by<store_permission>,           /* AT_PERMISSION */
 };
 
 } // namespace
@@ -414,5 +420,5 @@ constexpr std::array<handler, AT_COUNT> handlers = {
 void store_value(const attr_line &line) {
     if (line.attr.ta_type < 0 || line.attr.ta_type >= AT_COUNT)
         source_error(line.cx, MSG_UNKNOWN_ATTRIBUTE_TYPE);
-    handlers[static_cast<size_t>(line.attr.ta_type)](line);
+    handlers[static_cast<size_t>(line.attr.ta_type)](line.cx, line.attr, line.value, line.length);
 }

@@ -50,12 +50,19 @@ struct stanza_state {
 
 /* The current stanza. */
 struct stanza_framing {
+    /* No stanza is current any more. */
+    void leave() {
+        table_id = -1;
+        state = nullptr;
+    }
+
     int table_id = -1; /* its stanza_id; -1 before the first header */
     const srtable_ctrl *scp = nullptr;
     const srtable_ctrl *prev_scp = nullptr;
     const srtable_ctrl *curr_sd_scp = nullptr; /* of the latest header */
-    stanza_state *state = nullptr;             /* that of scp */
+    stanza_state *state = nullptr;             /* that of scp; null before the first header */
     char *record = nullptr;                    /* the staging record that scp fills */
+    bool watched = false;                      /* its lines are observed or traced */
     std::array<stanza_state, SC_COUNT> stanzas;
     std::shared_ptr<dflt_values> spare_dflt; /* no longer held by any stanza; for reuse */
 };

@@ -77,15 +77,14 @@ void begin_plain_stanza(cdgen &cx) {
     cx.sd.forget_owner();
 }
 
-void begin_stanza(cdgen &cx, const attr_text &text) {
+void begin_stanza(cdgen &cx, attr_text text) {
     *text.end = '\0';
     cx.framing.table_id = set_table_id({text.name, static_cast<size_t>(text.end - text.name)});
     if (cx.framing.table_id < 0)
         source_error(cx, MSG_UNKNOWN_STANZA, text.name);
     cx.framing.prev_scp = cx.framing.scp;
-    cx.framing.scp = cx.framing.curr_sd_scp = &sc_tables[static_cast<size_t>(cx.framing.table_id)];
-    cx.framing.state = &state_of(cx, cx.framing.scp);
-    cx.framing.record = sc_cb(cx, *cx.framing.scp);
+    make_current(cx, sc_tables[static_cast<size_t>(cx.framing.table_id)]);
+    cx.framing.curr_sd_scp = cx.framing.scp;
     if (cx.framing.scp->sc_sd_owner != nullptr)
         begin_sd_stanza(cx);
     else
@@ -94,13 +93,13 @@ void begin_stanza(cdgen &cx, const attr_text &text) {
 
 } // namespace
 
-void take_line(cdgen &cx, const attr_text &text) {
+void take_line(cdgen &cx, attr_text text) {
     if (text.name == text.line)
         begin_stanza(cx, text);
-    else if (cx.framing.table_id < 0)
+    else if (cx.framing.state == nullptr)
         source_error(cx, MSG_NO_STANZA);
     else
-        save_attr_line(cx, text, *cx.framing.scp, *cx.framing.state, cx.framing.record);
+        save_attr_line(cx, text);
 }
 
 namespace {

@@ -6,6 +6,6 @@
 
 /* Takes a header, if the line does not begin with a blank, or an attribute line. Writes a NUL at the text's end and may
  * modify it. */
-void take_line(cdgen &cx, const attr_text &text);
+void take_line(cdgen &cx, attr_text text);
 
 #endif

@@ -142,13 +142,13 @@ void take_source(cdgen &cx, const char *filename, int fd) {
         cdgen_error_exit(MSG_CANNOT_OPEN, filename, strerror(errno), 0, errno);
     source.device = st.st_dev;
     source.inode = st.st_ino;
-    cx.framing.table_id = -1;
+    cx.framing.leave();
 }
 
 void take_source(cdgen &cx, std::string_view bytes) {
     cx.source.cdb_fp.close();
     cx.source.cdb_fp.memory = bytes;
-    cx.framing.table_id = -1;
+    cx.framing.leave();
 }
 
 source_line next_line(cdgen &cx) {

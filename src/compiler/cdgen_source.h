@@ -44,8 +44,17 @@ struct source_reader {
     source_file cdb_fp;
     char inbuf[LINE_MAX_CHARS + SCAN_BLOCK] = {}; /* a line that has no newline after it in the buffer */
     int64_t linenum = 0;                          /* reads made; a line of more than LINE_MAX_CHARS takes several */
-    int linepos = 0;                              /* column, from 1 */
+    const char *latest_line = nullptr;            /* the beginning of the latest attribute line */
+    const char *latest_point = nullptr;           /* its value, or its name while the value is not known */
 
+    void point_at(const char *line, const char *point) {
+        latest_line = line;
+        latest_point = point;
+    }
+    /* The column that has been reached, from 1. */
+    int linepos() const {
+        return 1 + static_cast<int>(latest_point - latest_line);
+    }
     /* The number as messages show it. */
     int shown_line() const {
         return static_cast<int>(std::min<int64_t>(linenum, std::numeric_limits<int>::max()));

@@ -41,6 +41,13 @@ char *sc_cb(cdgen &cx, const srtable_ctrl &kind) {
     return reinterpret_cast<char *>(&cx.staged) + records[kind.sc_record];
 }
 
+void make_current(cdgen &cx, const srtable_ctrl &kind) {
+    cx.framing.scp = &kind;
+    cx.framing.state = &cx.framing.stanzas[static_cast<size_t>(&kind - sc_tables.data())];
+    cx.framing.record = sc_cb(cx, kind);
+    cx.framing.watched = cx.options.observer != nullptr || cx.options.debugLevel >= 2;
+}
+
 void (*sc_init_tbl(const srtable_ctrl &kind))(cdgen &) {
     auto id = static_cast<size_t>(&kind - sc_tables.data());
     return id < std::size(initialisers) ? initialisers[id] : init_sd_tbl;

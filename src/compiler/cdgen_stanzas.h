@@ -7,6 +7,9 @@
 /* The kind's staging record. */
 char *sc_cb(cdgen &cx, const srtable_ctrl &kind);
 
+/* Makes the kind's latest stanza the current one. */
+void make_current(cdgen &cx, const srtable_ctrl &kind);
+
 /* The function that opens the kind's staging record, after completing it if it is open. */
 void (*sc_init_tbl(const srtable_ctrl &kind))(cdgen &);
 

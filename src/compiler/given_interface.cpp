@@ -64,9 +64,32 @@ int strToVar(const char *s, orb_variable_type_t *t) {
     return known ? 0 : 1;
 }
 
+namespace {
+
+/* Another stanza is current for a while. */
+class other_stanza {
+public:
+    explicit other_stanza(stanza_framing &of) : framing(of), scp(of.scp), state(of.state), record(of.record) {}
+    other_stanza(const other_stanza &) = delete;
+    other_stanza &operator=(const other_stanza &) = delete;
+    ~other_stanza() {
+        framing.scp = scp;
+        framing.state = state;
+        framing.record = record;
+    }
+
+private:
+    stanza_framing &framing;
+    const srtable_ctrl *scp;
+    stanza_state *state;
+    char *record;
+};
+
+} // namespace
+
 void save_attr(cdgen &cx, char *il, int table_id) {
     char *name = il + strspn(il, " \t");
-    auto kind = static_cast<size_t>(table_id);
-    save_attr_line(cx, {il, name, name + strlen(name)}, sc_tables[kind], cx.framing.stanzas[kind],
-                   sc_cb(cx, sc_tables[kind]));
+    other_stanza while_taken(cx.framing);
+    make_current(cx, sc_tables[static_cast<size_t>(table_id)]);
+    save_attr_line(cx, {il, name, name + strlen(name)});
 }

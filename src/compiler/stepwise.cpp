@@ -159,9 +159,8 @@ void stepwise_compiler::give_up_run() {
 
 void stepwise_compiler::begin_ownerless_run(int kind) {
     cx.sd.begin_for(nobody, mk_sd_sec(cx));
-    cx.framing.scp = cx.framing.curr_sd_scp = &row_of(kind);
-    cx.framing.state = &cx.framing.stanzas[static_cast<size_t>(kind)];
-    cx.framing.record = sc_cb(cx, row_of(kind));
+    make_current(cx, row_of(kind));
+    cx.framing.curr_sd_scp = cx.framing.scp;
     cx.framing.table_id = kind;
     sc_init_tbl (*cx.framing.scp)(cx);
     cx.framing.state->restart();

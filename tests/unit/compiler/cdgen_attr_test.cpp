@@ -38,7 +38,7 @@ TEST(AttributeLine, LineOfBlanksIsNothing) {
     for (const char *line : {"", " ", "\t", " \t "}) {
         opened c;
         EXPECT_EQ(c.feeding(SC_RESOURCE_CLASS, line), WELL);
-        EXPECT_EQ(c.cx.source.linepos, 1 + static_cast<int>(strlen(line)));
+        EXPECT_EQ(c.cx.source.linepos(), 1 + static_cast<int>(strlen(line)));
     }
 }
 
@@ -62,7 +62,7 @@ TEST(AttributeLine, ColumnIsTheValues) {
     for (const auto &[line, column] : rows) {
         opened c;
         EXPECT_EQ(c.feeding(SC_RESOURCE_CLASS, line), WELL) << line;
-        EXPECT_EQ(c.cx.source.linepos, column) << line;
+        EXPECT_EQ(c.cx.source.linepos(), column) << line;
     }
 }
 
@@ -429,13 +429,11 @@ TEST(AttributeLine, TypeWithoutAHandlerIsUnknown) {
     char value[] = "1";
     for (int type : {-1, 32, 33, std::numeric_limits<int>::max()}) {
         const table_attrs attr = {"Other", type, 0, 0x1, 0};
-        const attr_line line = {c.cx,
-                                sc_tables[SC_RESOURCE_CLASS],
-                                c.state(SC_RESOURCE_CLASS),
-                                reinterpret_cast<char *>(&c.cx.staged.cb_rsrc_class),
-                                attr,
-                                value};
-        EXPECT_EQ(ending_of([&] { store_value(line); }), (ending{"Unknown attribute", LINE, 1})) << type;
+        EXPECT_EQ(ending_of([&] {
+                      store_value({c.cx, attr, value, 1});
+                  }),
+                  (ending{"Unknown attribute", LINE, 1}))
+            << type;
     }
 }
 

@@ -2,6 +2,7 @@
  * own tests. */
 
 #include "compiler/cdgen_attr.h"
+#include "compiler/cdgen_stanzas.h"
 #include "compiler/source_fixture.h"
 
 namespace {
@@ -131,8 +132,8 @@ TEST(PlainValue, UnusedIntegerTypesHaveTheirWidths) {
         c.cx.staged.cb_rsrc_class.rc_version = 0xFFFFFFFF;
         char value[] = "0x12345678";
         const table_attrs attr = {"Other", type, offsetof(rsrc_class_t, rc_version), 0x1, 0};
-        store_value({c.cx, sc_tables[SC_RESOURCE_CLASS], c.state(SC_RESOURCE_CLASS),
-                     reinterpret_cast<char *>(&c.cx.staged.cb_rsrc_class), attr, value});
+        make_current(c.cx, sc_tables[SC_RESOURCE_CLASS]);
+        store_value({c.cx, attr, value, strlen(value)});
         EXPECT_EQ(c.cx.staged.cb_rsrc_class.rc_version, expected) << type;
     }
 }

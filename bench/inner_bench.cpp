@@ -31,7 +31,7 @@ private:
     std::optional<tbl> table;
 };
 
-void int_from_text_of(benchmark::State &state, const char *text) {
+void int_from_text_of(benchmark::State &state, const std::string &text) {
     cdgen cx;
     for (auto _ : state)
         benchmark::DoNotOptimize(int_from_text(cx, text, nullptr, 0));
@@ -39,7 +39,7 @@ void int_from_text_of(benchmark::State &state, const char *text) {
 BENCHMARK_CAPTURE(int_from_text_of, decimal, "42170");
 BENCHMARK_CAPTURE(int_from_text_of, hexadecimal, "0xA4BA");
 
-void str_to_vx_of(benchmark::State &state, vx_data_type_t type, const char *text) {
+void str_to_vx_of(benchmark::State &state, vx_data_type_t type, const std::string &text) {
     cdgen cx;
     text_pool pool;
     vx_value_t value = {};
@@ -93,7 +93,7 @@ void add_to_tbl_of(benchmark::State &state) {
 }
 BENCHMARK(add_to_tbl_of)->Arg(12)->Arg(230);
 
-void copy_this_type_of(benchmark::State &state, vx_data_type_t type, const char *text) {
+void copy_this_type_of(benchmark::State &state, vx_data_type_t type, const std::string &text) {
     cdgen cx;
     text_pool pool;
     bounded_table strings;

@@ -2,9 +2,11 @@
 
 #include "compiler/cdgen_attr.h"
 
+#include "compiler/cdgen_digits.h"
 #include "compiler/cdgen_kinds.h"
 #include "compiler/cdgen_stanzas.h"
 #include "compiler/cdgen_values.h"
+#include "compiler/cdgen_words.h"
 #include "format/constants.h"
 
 #include <cerrno>
@@ -50,35 +52,43 @@ tbl *strings_of(const attr_line &line) {
 
 /* ---- Plain values ---------------------------------------------------------------------------------------------- */
 
+/* For numbers that only the C library reads, and for texts that are not numbers. */
+template <class Width> [[gnu::noinline]] void store_other_integer(cdgen &cx, char *field, std::string_view value) {
+    store(field, static_cast<Width>(int_from_text(cx, value, nullptr, 0)));
+}
+
 /* Deliberately truncated to the field's width, without a range check. */
 template <class Width> void store_integer(const attr_line &line) {
-    store(field_of(line), static_cast<Width>(integer(line, value_of(line))));
+    vx_uint64_t plain = 0;
+    if (!plain_decimal(value_of(line), &plain))
+        return store_other_integer<Width>(line.cx, field_of(line), value_of(line));
+    store(field_of(line), static_cast<Width>(plain));
 }
 
 void store_string(const attr_line &line) {
     store(field_of(line), add_to_tbl(line.cx, strings_of(line), line.value, line.length + 1));
 }
 
-void store_props(const attr_line &line, const props_t *props, int count) {
+void store_props(const attr_line &line, std::span<const props_t> props) {
     auto bits = load<vx_uint32_t>(field_of(line));
-    set_props(&bits, props, count, line.value);
+    set_props(&bits, props, line.value, line.length);
     store(field_of(line), bits);
 }
 
 void store_class_props(const attr_line &line) {
-    store_props(line, rc_props, rc_props_cnt);
+    store_props(line, rc_props);
 }
 
 void store_pattr_props(const attr_line &line) {
-    store_props(line, pa_props, pa_props_cnt);
+    store_props(line, pa_props);
 }
 
 void store_dattr_props(const attr_line &line) {
-    store_props(line, da_props, da_props_cnt);
+    store_props(line, da_props);
 }
 
 void store_action_props(const attr_line &line) {
-    store_props(line, act_props, act_props_cnt);
+    store_props(line, act_props);
 }
 
 void store_version(const attr_line &line) {
@@ -136,11 +146,12 @@ struct bounds {
 
 /* Splits the value at its first comma, in place. Returns no value if there is no comma. */
 std::optional<bounds> split_bounds(const attr_line &line) {
-    char *high = getNextArrVal(line.value);
-    if (high == nullptr)
+    char *comma = find_character(line.value, line.length, ',');
+    if (comma == nullptr)
         return std::nullopt;
-    auto low_length = static_cast<size_t>(high - 1 - line.value);
-    return bounds{{line.value, low_length}, {high, line.length - low_length - 1}};
+    *comma = '\0';
+    auto low_length = static_cast<size_t>(comma - line.value);
+    return bounds{{line.value, low_length}, {comma + 1, line.length - low_length - 1}};
 }
 
 /* The offset of a list's next entry. The list's header has room for the first entry; each other entry is added at the

@@ -4,6 +4,7 @@
 
 #include "compiler/cdgen_context.h"
 #include "compiler/cdgen_digits.h"
+#include "compiler/cdgen_words.h"
 #include "language/name_index.h"
 #include "language/same_bytes.h"
 
@@ -236,14 +237,18 @@ vx_int64_t octal_escape(cdgen &cx, const char **p) {
     char digits[4] = {};
     strncpy(digits, *p, 3);
     char *end = nullptr;
-    vx_int64_t value = int_from_text(cx, digits, &end, 8);
+    vx_int64_t value = library_integer(cx, digits, &end, 8);
     *p += end - digits;
     return end == digits ? 256 : value;
 }
 
-bool is_named(const props_t &property, std::string_view name) {
-    return name.size() < sizeof property.s && property.s[name.size()] == '\0' &&
-           language::same_bytes(property.s, name.data(), name.size());
+/* Null if there is no property of that name. */
+const props_t *find_property(std::span<const props_t> known, std::string_view name) {
+    for (const props_t &property : known)
+        if (name.size() < sizeof property.s && property.s[name.size()] == '\0' &&
+            language::same_bytes(property.s, name.data(), name.size()))
+            return &property;
+    return nullptr;
 }
 
 void store_length(char *block, size_t length) {
@@ -267,8 +272,7 @@ std::optional<orb_variable_type_t> variable_type_named(std::string_view name) {
 
 vx_int64_t int_from_text(cdgen &cx, std::string_view text, char **end, int base) {
     vx_uint64_t plain = 0;
-    bool digits = plain_unsigned(text, &plain);
-    if (!digits || base == 8 || (base == 0 && text[0] == '0' && text.size() > 1)) /* or not decimal digits */
+    if (base == 8 || !(base == 0 ? plain_decimal(text, &plain) : all_digits(text, &plain)))
         return library_integer(cx, text.data(), end, base);
     if (end != nullptr)
         *end = const_cast<char *>(text.data() + text.size());
@@ -335,17 +339,18 @@ char *strip_quotes(char *s, char **end) {
     return open == close ? open : open + 1;
 }
 
-void set_props(vx_uint32_t *dest, const props_t *props, int len, char *vnoq) {
-    for (char *rest = vnoq; rest != nullptr;) {
-        char *name = rest;
-        rest = getNextArrVal(rest);
-        if (*name == '\0') /* an empty field */
+void set_props(vx_uint32_t *dest, std::span<const props_t> props, char *list, size_t length) {
+    char *end = list + length;
+    for (char *name = list, *rest = nullptr; name != nullptr; name = rest) {
+        char *name_end = find_character(name, static_cast<size_t>(end - name), ',');
+        rest = name_end != nullptr ? name_end + 1 : nullptr;
+        if (name_end == nullptr)
+            name_end = end;
+        *name_end = '\0';
+        if (name == name_end) /* an empty field */
             continue;
-        size_t length = rest != nullptr ? static_cast<size_t>(rest - 1 - name) : strlen(name);
-        const props_t *known = props;
-        while (known < props + len && !is_named(*known, {name, length}))
-            ++known;
-        if (known == props + len)
+        const props_t *known = find_property(props, {name, static_cast<size_t>(name_end - name)});
+        if (known == nullptr)
             cdgen_error_exit(MSG_INVALID_PROPERTY, name, nullptr, 0, 1);
         *dest |= known->p;
     }
@@ -364,12 +369,4 @@ int ver_str_convert(cdgen &cx, const char *ver_str, vx_uint32_t *n) {
     /* The last one is deliberately not masked. */
     *n = component[0] << 24 | (component[1] & 255) << 16 | (component[2] & 255) << 8 | component[3];
     return 0;
-}
-
-char *getNextArrVal(char *line) {
-    char *comma = line == nullptr ? nullptr : strchr(line, ',');
-    if (comma == nullptr)
-        return nullptr;
-    *comma = '\0';
-    return comma + 1;
 }

@@ -10,6 +10,7 @@
 #include <cstddef>
 #include <cstring>
 #include <optional>
+#include <span>
 #include <string_view>
 
 /* What a value is written for. */
@@ -28,8 +29,9 @@ vx_data_type_t data_type_named(std::string_view name);
 /* The code of a variable type by its name; no value for an unknown name. */
 std::optional<orb_variable_type_t> variable_type_named(std::string_view name);
 
-/* In the following functions, a text ends with a NUL. Integers of 64 bits, on every machine, by the rules of the C
- * library, base 0, 8 or 10. An overflow is remembered in cx.conv_errno. */
+/* In the following functions, a text ends with a NUL; however short it is, nine bytes from its beginning on may be
+ * read. Integers of 64 bits, on every machine, by the rules of the C library, base 0, 8 or 10. An overflow is
+ * remembered in cx.conv_errno. */
 vx_int64_t int_from_text(cdgen &cx, std::string_view text, char **end, int base);
 
 /* Converts text into *vx_out, for an array type into one element; 0, or -1 if the text is not a value of the type.
@@ -43,12 +45,10 @@ int oct_convert(cdgen &cx, const char *p, int type, char *out_buf);
  * NUL over the closing quote. The text must end, with a NUL, at *end, which becomes the end of what is returned. */
 char *strip_quotes(char *s, char **end);
 /* ORs the bits of the properties named in a comma-separated list, which it takes apart, into *dest. An unknown name is
- * fatal. */
-void set_props(vx_uint32_t *dest, const props_t *props, int len, char *vnoq);
+ * fatal. The list ends with a NUL; seven bytes after it may be read. */
+void set_props(vx_uint32_t *dest, std::span<const props_t> props, char *list, size_t length);
 /* Packs up to four dotted numbers into *n; always 0. */
 int ver_str_convert(cdgen &cx, const char *ver_str, vx_uint32_t *n);
-/* Ends the text at its first comma and returns what follows; null without a comma. */
-char *getNextArrVal(char *line);
 
 /* How many bytes of its cell a number of the type takes; 0 for a type that is not a number. */
 constexpr size_t number_width(vx_data_type_t type) {

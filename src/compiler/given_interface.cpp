@@ -93,3 +93,16 @@ void save_attr(cdgen &cx, char *il, int table_id) {
     make_current(cx, sc_tables[static_cast<size_t>(table_id)]);
     save_attr_line(cx, {il, name, name + strlen(name)});
 }
+
+void set_props(vx_uint32_t *dest, const props_t *props, int len, char *vnoq) {
+    if (vnoq != nullptr)
+        set_props(dest, {props, static_cast<size_t>(len)}, vnoq, strlen(vnoq));
+}
+
+char *getNextArrVal(char *line) {
+    char *comma = line == nullptr ? nullptr : strchr(line, ',');
+    if (comma == nullptr)
+        return nullptr;
+    *comma = '\0';
+    return comma + 1;
+}

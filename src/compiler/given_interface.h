@@ -3,6 +3,7 @@
 #define CDGEN_GIVEN_INTERFACE_H
 
 #include "compiler/cdgen_context.h"
+#include "format/names.h"
 
 /* Copies len bytes and zeroes on to the next multiple of 8, for which dst must have room. Part of the fixed interface;
  * nothing calls it. */
@@ -44,5 +45,12 @@ void save_attr(cdgen &cx, char *il, int table_id);
 /* The text inside a pair of double quotes, as the other strip_quotes finds it; null for null. Part of the fixed
  * interface; nothing calls it. */
 char *strip_quotes(char *s);
+
+/* The other set_props, which is given the length of the list. Part of the fixed interface; nothing calls it. */
+void set_props(vx_uint32_t *dest, const props_t *props, int len, char *vnoq);
+
+/* Ends the text at its first comma and returns what follows; null without a comma. Part of the fixed interface; nothing
+ * calls it. */
+char *getNextArrVal(char *line);
 
 #endif

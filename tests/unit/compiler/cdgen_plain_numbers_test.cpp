@@ -19,7 +19,7 @@ template <class Number> Number converted(const std::string &text, vx_data_type_t
     static cdgen cx;
     text_pool pool;
     vx_value_t cell = {};
-    EXPECT_EQ(str_to_vx(cx, &cell, type, text.c_str(), pool), 0) << text;
+    EXPECT_EQ(str_to_vx(cx, &cell, type, text, pool), 0) << text;
     Number number;
     memcpy(&number, &cell, sizeof number);
     return number;
@@ -181,7 +181,7 @@ TEST(PlainInteger, TakesASignAsTheLibraryDoes) {
 TEST(PlainInteger, RefusesWhatTheLibraryRefuses) {
     cdgen cx;
     text_pool pool;
-    for (const char *text : {"-", "--5", "-5x", "- 5", "+-5", "5-"}) {
+    for (std::string text : {"-", "--5", "-5x", "- 5", "+-5", "5-"}) {
         vx_value_t cell = {};
         EXPECT_EQ(str_to_vx(cx, &cell, VX_INT64, text, pool), -1) << text;
     }

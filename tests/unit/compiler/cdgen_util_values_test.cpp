@@ -190,8 +190,8 @@ TEST(Floats, NanIsTakenWhateverHappenedBefore) {
     for (int left : {0, ERANGE, EINVAL}) {
         marked cx(left);
         vx_value_t single = {}, pair = {};
-        EXPECT_EQ(str_to_vx(cx, &single, VX_FLOAT32, "nan", cx.line_texts), 0);
-        EXPECT_EQ(str_to_vx(cx, &pair, VX_FLOAT64_ARRAY, "-NAN", cx.line_texts), 0);
+        EXPECT_EQ(str_to_vx(cx, &single, VX_FLOAT32, with_room("nan"), cx.line_texts), 0);
+        EXPECT_EQ(str_to_vx(cx, &pair, VX_FLOAT64_ARRAY, with_room("-NAN"), cx.line_texts), 0);
         EXPECT_TRUE(std::isnan(single.val_float32));
         EXPECT_TRUE(std::isnan(pair.val_float64));
     }
@@ -207,7 +207,7 @@ TEST(Floats, NothingMayFollowTheNumber) {
 
 int convert(cdgen &cx, vx_data_type_t type, const char *text) {
     vx_value_t value = {};
-    return str_to_vx(cx, &value, type, text, cx.line_texts);
+    return str_to_vx(cx, &value, type, with_room(text), cx.line_texts);
 }
 
 TEST(OverflowMark, RefusesZerosFromThenOn) {
@@ -279,8 +279,9 @@ TEST(PlainNumbers, FollowTheBase) {
                           {"-99999999999999999999", 0, INT64_MIN, 21}}) {
         cdgen cx;
         char *end = nullptr;
-        EXPECT_EQ(int_from_text(cx, row.text, &end, row.base), row.value) << row.text;
-        EXPECT_EQ(end, row.text + row.taken) << row.text;
+        std::string text = with_room(row.text);
+        EXPECT_EQ(int_from_text(cx, text, &end, row.base), row.value) << row.text;
+        EXPECT_EQ(end, text.data() + row.taken) << row.text;
     }
 }
 
@@ -290,9 +291,9 @@ TEST(Texts, AreCopiedAsTheyStand) {
     for (const char *text : {"disk", " two words ", "a\"b\\101", "0", "0x0"})
         for (vx_data_type_t type : {VX_CHAR_PTR, VX_CHAR_PTR_ARRAY}) {
             cdgen cx;
-            std::string original = text;
+            std::string original = with_room(text);
             vx_value_t value = {};
-            ASSERT_EQ(str_to_vx(cx, &value, type, original.c_str(), cx.line_texts), 0) << text;
+            ASSERT_EQ(str_to_vx(cx, &value, type, original, cx.line_texts), 0) << text;
             original.assign(original.size(), '#');
             EXPECT_STREQ(value.ptr_char, text);
         }
@@ -323,7 +324,7 @@ TEST(Binaries, AreHexadecimalAfterAZeroElseEscaped) {
         for (vx_data_type_t type : {VX_BINARY_PTR, VX_BINARY_PTR_ARRAY}) {
             cdgen cx;
             vx_value_t value = {};
-            ASSERT_EQ(str_to_vx(cx, &value, type, r.text, cx.line_texts), 0) << r.text;
+            ASSERT_EQ(str_to_vx(cx, &value, type, with_room(r.text), cx.line_texts), 0) << r.text;
             EXPECT_EQ(bytes_at(value.ptr_binary, r.value.size()), r.value) << r.text;
         }
     cdgen cx;
@@ -429,7 +430,8 @@ TEST(Quotes, MustMatch) {
 
 constexpr props_t props[] = {{"Public", 0x1}, {"Required", 0x20}, {"Public", 0x400}, {"Hidden", 0x8000}};
 
-vx_uint32_t props_of(std::string list) {
+vx_uint32_t props_of(std::string_view text) {
+    std::string list = with_room(text);
     vx_uint32_t bits = 0x80000002;
     set_props(&bits, props, 4, list.data());
     return bits;
@@ -446,8 +448,10 @@ TEST(Properties, AddTheirBits) {
 TEST(Properties, UnknownOnesAreFatal) {
     cdgen cx;
     cx.source.linenum = 7;
-    auto end = [&](std::string list) {
+    std::string list; /* messages refer to it */
+    auto end = [&](std::string_view text) {
         vx_uint32_t bits = 0;
+        list = with_room(text);
         return ending_of([&] { set_props(&bits, props, 3, list.data()); });
     };
     EXPECT_EQ(end("public"), (ending{"public: invalid property", 0, 1}));

@@ -96,6 +96,13 @@ inline vx_data_type_t type_of_code(vx_uint32_t code) {
     return static_cast<vx_data_type_t>(code);
 }
 
+/* A text after which READ_AHEAD bytes may be read. */
+inline std::string with_room(std::string_view text) {
+    std::string held(text);
+    held.reserve(text.size() + READ_AHEAD);
+    return held;
+}
+
 /* A text and what becomes of it. */
 template <class Value> struct row {
     const char *text;
@@ -121,7 +128,8 @@ void expect_taken(std::span<const int> left, vx_data_type_t type, std::span<cons
             for (vx_uint32_t code : {type + 0U, type + 11U}) {
                 marked cx(error);
                 vx_value_t value = {};
-                EXPECT_EQ(str_to_vx(cx, &value, type_of_code(code), r.text, cx.line_texts), 0) << r.text << error;
+                EXPECT_EQ(str_to_vx(cx, &value, type_of_code(code), with_room(r.text), cx.line_texts), 0)
+                    << r.text << error;
                 EXPECT_EQ(value.*member, r.value) << r.text << " as " << code << " after " << error;
             }
 }
@@ -131,7 +139,7 @@ inline void expect_refused(std::span<const int> left, vx_data_type_t type, const
         for (vx_uint32_t code : {type + 0U, type + 11U}) {
             marked cx(error);
             vx_value_t value = {.val_uint64 = 77};
-            EXPECT_EQ(str_to_vx(cx, &value, type_of_code(code), text, cx.line_texts), -1)
+            EXPECT_EQ(str_to_vx(cx, &value, type_of_code(code), with_room(text), cx.line_texts), -1)
                 << '"' << text << "\" as " << code << " after " << error;
             EXPECT_EQ(value.val_uint64, 77U) << '"' << text << "\" as " << code;
         }

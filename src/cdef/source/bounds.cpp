@@ -113,7 +113,7 @@ std::optional<bound> element_of(const bound &array, const class_plan &plan) {
     if (!element || !cdb::is_array(array.value.type()))
         return std::nullopt;
     std::size_t place = *array.value.place() + cdb::value::ELEMENTS;
-    return bound{*element, plan.owners->is_own(plan.view.side_tables().strings, place)};
+    return bound{*element, plan.owners.is_own(plan.view.side_tables().strings, place)};
 }
 
 /* False if the only element of a bound leads to something that the bound does not own. */

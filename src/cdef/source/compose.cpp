@@ -125,8 +125,8 @@ private:
     }
 
     void write_locator() {
-        if (!plan.locator.empty())
-            out.line("Locator", plan.locator);
+        if (plan.whole.locator_in == plan.position)
+            out.line("Locator", plan.whole.locator);
     }
 
     const class_plan &plan;
@@ -150,18 +150,20 @@ struct plain_stanza_writer {
 
 /* A locator is looked up in the last class only, but a line in any class can give it. The latest class that can have
  * the line gets it. */
-void plan_locator(std::vector<class_plan> &plans) {
-    for (const class_plan &plan : plans)
-        if (!plan.is_last && plan.view.record().rc_locator != 0)
+void plan_locator(class_plans &plans) {
+    std::optional<std::size_t> latest;
+    plans.each([&](const class_plan &plan) {
+        const rsrc_class_t &rc = plan.view.record();
+        if (has_all_required(rc))
+            latest = plan.position;
+        bool is_given = rc.rc_locator != (plan.is_last ? NO_LOCATOR : 0);
+        if (is_given && !(plan.is_last && latest))
             no_source(place_of("ResourceClass", plan.view.name()), "it has a locator, which no line can set");
-    const cdb::resource_class &last = plans.back().view;
-    if (last.record().rc_locator == NO_LOCATOR)
-        return;
-    auto giver = std::find_if(plans.rbegin(), plans.rend(),
-                              [](const class_plan &plan) { return has_all_required(plan.view.record()); });
-    if (giver == plans.rend())
-        no_source(place_of("ResourceClass", last.name()), "it has a locator, which no line can set");
-    giver->locator = locator_name(last);
+        if (!is_given)
+            return;
+        plans.whole.locator = locator_name(plan.view);
+        plans.whole.locator_in = latest;
+    });
 }
 
 void write_control_definition(source_writer &out, const cdb::resource_class &c) {
@@ -220,21 +222,16 @@ void write_map(source_writer &out, const cdb::database &db) {
 
 /* ---- The whole ------------------------------------------------------------------------------------------------- */
 
-std::vector<class_plan> plans_of(const cdb::database &db, const cdb::ownership &owners) {
-    std::vector<class_plan> plans;
-    for (const cdb::resource_class &c : db.classes())
-        plans.emplace_back(c, owners);
-    plans.back().is_last = true;
-    for (class_plan &plan : plans)
-        plan_order(plan);
+class_plans plans_of(const cdb::database &db, const cdb::ownership &owners) {
+    require_settable(db);
+    class_plans plans(db, owners);
+    plans.each([](class_plan &plan) { plan_order(plan); });
     plan_ranges(plans);
     plan_variable_classes(plans, db);
     plan_locator(plans);
-    for (class_plan &plan : plans) {
-        if (plan.ends_in_run)
-            plan.map_before = 0;
-        separate_runs(plan);
-    }
+    if (plans.whole.ends_in_run)
+        plans.whole.map_before = 0;
+    plans.each([](class_plan &plan) { separate_runs(plan); });
     return plans;
 }
 
@@ -247,11 +244,12 @@ void write_long_comment(source_writer &out, std::string_view text) {
 
 /* The name of the classes without a Name line, which the compiler takes from the output file. No value if there are no
  * such classes. */
-std::optional<std::string> default_name(const std::vector<class_plan> &plans) {
+std::optional<std::string> default_name(class_plans &plans) {
     std::optional<std::string> output;
-    for (const class_plan &plan : plans)
+    plans.each([&](const class_plan &plan) {
         if (!can_be_named(plan.view))
             require_default_name(plan.view, output);
+    });
     return output;
 }
 
@@ -260,6 +258,16 @@ void write_heading(source_writer &out, const std::optional<std::string> &output)
     if (output)
         write_long_comment(out, "The class is called after the output file, which has to be " +
                                     text::quoted_ascii(*output + std::string(SUFFIX)) + ".");
+}
+
+/* The stanzas of a class. The last class has the map among them. */
+void write_stanzas(source_writer &out, const class_plan &plan, const cdb::database &db) {
+    std::size_t end = plan.order.size();
+    std::size_t map_before = plan.map_before().value_or(end);
+    write_steps(out, plan, 0, map_before);
+    if (plan.is_last)
+        write_map(out, db);
+    write_steps(out, plan, map_before, end);
 }
 
 /* Gives the system what has been freed. The C library keeps memory that is freed between blocks that are still used, as
@@ -280,9 +288,8 @@ std::vector<std::size_t> own_fields(stanza_id stanza) {
     return sc_tables[stanza].sc_record == STAGED_SD_DEF ? own_element_fields() : own_attribute_fields(stanza);
 }
 
-proven_source::proven_source(const cdb::database &database, const cdb::ownership &owners) : db(database) {
-    require_settable(db);
-    plans = plans_of(db, owners);
+proven_source::proven_source(const cdb::database &database, const cdb::ownership &owners)
+    : db(database), plans(plans_of(db, owners)) {
     give_back_freed_memory();
     output = default_name(plans);
     std::string file = output.value_or("Class") + std::string(SUFFIX);
@@ -291,21 +298,17 @@ proven_source::proven_source(const cdb::database &database, const cdb::ownership
     compiled.require_equal();
 }
 
-void proven_source::compose(const part_taker &to) const {
+void proven_source::compose(const part_taker &to) {
     source_writer out(to);
     write_heading(out, output);
-    for (const class_plan &plan : plans) {
+    plans.each([&](const class_plan &plan) {
         write_control_definition(out, plan.view);
         resource_class_writer(out, plan).write();
-        if (&plan == &plans.front())
+        if (plan.position == 0)
             for (const cdb::variable_class &v : db.variable_classes())
                 write_variable_class(out, v);
-        std::size_t end = plan.order.size(), map_before = plan.map_before.value_or(end);
-        write_steps(out, plan, 0, map_before);
-        if (plan.is_last)
-            write_map(out, db);
-        write_steps(out, plan, map_before, end);
-    }
+        write_stanzas(out, plan, db);
+    });
     out.flush();
 }
 

@@ -20,11 +20,11 @@ public:
     proven_source(const cdb::database &database, const cdb::ownership &owners);
 
     /* Composes the source and passes it on in parts. */
-    void compose(const part_taker &to) const;
+    void compose(const part_taker &to);
 
 private:
     const cdb::database &db;
-    std::vector<class_plan> plans;
+    class_plans plans;
     std::optional<std::string> output; /* see default_name() */
 };
 

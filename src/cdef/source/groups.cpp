@@ -29,30 +29,30 @@ struct group {
 };
 
 /* Only an attribute that has all its required lines can name a variable class. */
-void add_members(std::vector<member> &to, const class_plan &plan, std::size_t of_class, cdb::level level) {
+void add_members(std::vector<member> &to, const class_plan &plan, cdb::level level) {
     var_id_t mark = level == cdb::level::of_class ? VAR_ID_CLASS_ATTR : 0;
     std::size_t index = 0;
     for (const cdb::dynamic_attribute &attr : plan.view.dynamic_attributes(level)) {
         if (is_complete(attr))
-            to.push_back({static_cast<var_id_t>(attr.id()) | mark, of_class, level, index});
+            to.push_back({static_cast<var_id_t>(attr.id()) | mark, plan.position, level, index});
         ++index;
     }
 }
 
 /* In the order in which the compiler lists them. */
-std::vector<member> members_of(const std::vector<class_plan> &classes) {
+std::vector<member> members_of(class_plans &classes) {
     std::vector<member> members;
-    for (std::size_t c = 0; c < classes.size(); ++c) {
-        add_members(members, classes[c], c, cdb::level::of_class);
-        add_members(members, classes[c], c, cdb::level::of_resource);
-    }
+    classes.each([&](const class_plan &plan) {
+        add_members(members, plan, cdb::level::of_class);
+        add_members(members, plan, cdb::level::of_resource);
+    });
     return members;
 }
 
 /* If several variable classes have the same name, the first gets all IDs. */
 std::vector<group> groups_of(const cdb::database &db) {
     std::vector<group> groups;
-    std::unordered_set<std::string> names;
+    std::unordered_set<std::string_view> names;
     for (const cdb::variable_class &v : db.variable_classes()) {
         bool first = names.emplace(v.name()).second;
         group list = {std::string(v.name()), {}};
@@ -183,7 +183,7 @@ std::optional<std::vector<std::optional<std::size_t>>> deal_out(const std::vecto
     return dealing.deal() ? std::optional(dealing.result()) : std::nullopt;
 }
 
-void plan_variable_classes(std::vector<class_plan> &classes, const cdb::database &db) {
+void plan_variable_classes(class_plans &classes, const cdb::database &db) {
     std::vector<member> members = members_of(classes);
     std::vector<group> groups = groups_of(db);
     std::vector<var_id_t> ids(members.size());

@@ -16,7 +16,7 @@ std::optional<std::vector<std::optional<std::size_t>>> deal_out(const std::vecto
                                                                 const std::vector<std::vector<var_id_t>> &lists);
 
 /* Sets the variable class of each dynamic attribute. Throws no_source_error if no source produces the lists. */
-void plan_variable_classes(std::vector<class_plan> &classes, const cdb::database &db);
+void plan_variable_classes(class_plans &classes, const cdb::database &db);
 
 } // namespace cdef::source
 

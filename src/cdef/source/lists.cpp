@@ -34,8 +34,10 @@ std::vector<std::string> texts_of_pair(const cdb::valid_value &v) {
 } // namespace
 
 void write_varieties(source_writer &out, const cdb::variety_list &varieties) {
-    for (const cdb::variety &v : varieties)
+    for (const cdb::variety &v : varieties) {
         out.line("VarietyRange", std::to_string(v.low) + "," + std::to_string(v.high));
+        out.flush_if_full();
+    }
 }
 
 void write_valid_values(source_writer &out, std::string_view name, const cdb::valid_value_list &values) {

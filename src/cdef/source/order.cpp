@@ -65,7 +65,8 @@ bool is_structured(const cdb::resource_class &c, const step &s) {
 /* The last run for the class that directly follows an attribute of structured data or its run. */
 std::optional<std::size_t> last_misplaced_run(const class_plan &plan) {
     for (std::size_t i = plan.order.size(); i-- > 1;)
-        if (plan.order[i].from == table::inputs && i != plan.map_before && is_structured(plan.view, plan.order[i - 1]))
+        if (plan.order[i].from == table::inputs && i != plan.map_before() &&
+            is_structured(plan.view, plan.order[i - 1]))
             return i;
     return std::nullopt;
 }
@@ -95,7 +96,7 @@ void put_last(class_plan &plan) {
     if (late == plan.order.end() || !plan.is_last || late->index + 1 != plan.count(late->from))
         return;
     std::rotate(late, late + 1, plan.order.end());
-    plan.ends_in_run = true;
+    plan.whole.ends_in_run = true;
 }
 
 } // namespace
@@ -128,8 +129,8 @@ void plan_order(class_plan &plan) {
 /* The map stays at the end if the run of an attribute would end the file without it. */
 void separate_runs(class_plan &plan) {
     while (std::optional<std::size_t> misplaced = last_misplaced_run(plan)) {
-        if (plan.is_last && !plan.map_before && !is_structured(plan.view, plan.order.back())) {
-            plan.map_before = misplaced;
+        if (plan.is_last && !plan.map_before() && !is_structured(plan.view, plan.order.back())) {
+            plan.whole.map_before = misplaced;
             continue;
         }
         auto run = plan.order.begin() + static_cast<std::ptrdiff_t>(*misplaced);

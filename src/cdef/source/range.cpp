@@ -283,19 +283,19 @@ dynamic_attributes attributes_of(const class_plan &plan) {
         found.order.push_back(s.from);
         (s.from == table::dynamic_attributes ? found.of_resource : found.of_class).push_back(range_of(plan, s));
     }
-    if (plan.ends_in_run && !found.order.empty() && plan.order.back().from == found.order.back())
+    if (plan.ends_in_run() && !found.order.empty() && plan.order.back().from == found.order.back())
         found.has_to_end = found.order.back();
     return found;
 }
 
-std::optional<std::vector<range_lines>> lines_for(const std::vector<class_plan> &classes) {
+std::optional<std::vector<range_lines>> lines_for(class_plans &classes) {
     std::vector<dynamic_attributes> attributes(classes.size());
-    std::transform(classes.begin(), classes.end(), attributes.begin(), attributes_of);
+    classes.each([&](const class_plan &plan) { attributes[plan.position] = attributes_of(plan); });
     return find_range_lines(attributes);
 }
 
 /* The dynamic attributes keep the places of such attributes among the other stanzas. */
-void use(range_lines &lines, class_plan &plan) {
+void use(range_lines &lines, const class_plan &plan) {
     std::size_t of_class = 0, of_resource = 0;
     auto kind = lines.order.begin();
     for (step &s : plan.order)
@@ -318,12 +318,11 @@ std::optional<std::vector<range_lines>> find_range_lines(const std::vector<dynam
     return in_order ? in_order : planner(classes, true).run();
 }
 
-void plan_ranges(std::vector<class_plan> &classes) {
+void plan_ranges(class_plans &classes) {
     auto lines = lines_for(classes);
     if (!lines)
         no_source("dynamic attributes", "no combination of Range lines gives all of them their bounds");
-    for (std::size_t c = 0; c < classes.size(); ++c)
-        use((*lines)[c], classes[c]);
+    classes.each([&](const class_plan &plan) { use((*lines)[plan.position], plan); });
 }
 
 } // namespace cdef::source

@@ -35,7 +35,7 @@ struct range_lines {
 std::optional<std::vector<range_lines>> find_range_lines(const std::vector<dynamic_attributes> &classes);
 
 /* Sets the Range lines of all dynamic attributes, and their order. Throws no_source_error if there are none. */
-void plan_ranges(std::vector<class_plan> &classes);
+void plan_ranges(class_plans &classes);
 
 } // namespace cdef::source
 

@@ -169,7 +169,7 @@ private:
                                  .definition = attr.structure(),
                                  .value = own_value(),
                                  .highest_index = attr.record().ra_max_sd_idx,
-                                 .ends_file = plan.ends_in_run && is_last_step()};
+                                 .ends_file = plan.ends_in_run() && is_last_step()};
         if (cdb::element_type(attr.type()) == VX_SD_PTR)
             write_structure(out, s, from.place);
         else if (!s.definition.empty() || s.highest_index != NO_SD_INDEX)

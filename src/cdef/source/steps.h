@@ -91,23 +91,42 @@ struct dynamic_plan {
     std::string range;          /* the value of a Range line; empty: no line */
 };
 
-struct class_plan {
-    class_plan(const cdb::resource_class &of, const cdb::ownership &ownership) : view(of), owners(&ownership) {}
-
-    cdb::resource_class view;
-    const cdb::ownership *owners;
-    bool is_last = false; /* no class follows */
+/* What is planned for one class. A database may have many classes, so this must be small. */
+struct class_decisions {
     std::vector<step> order;
-    bool ends_in_run = false;                         /* the last step's run of SD stanzas ends the file */
-    std::optional<std::size_t> map_before;            /* index of the step before which the map is; none: at the end */
-    std::string locator;                              /* the value of a Locator line; empty: no line */
     std::array<std::vector<dynamic_plan>, 2> dynamic; /* by level */
 
     std::vector<dynamic_plan> &of(cdb::level level) {
         return dynamic[static_cast<std::size_t>(level)];
     }
-    const std::vector<dynamic_plan> &of(cdb::level level) const {
-        return dynamic[static_cast<std::size_t>(level)];
+};
+
+/* What is planned once for a whole source. */
+struct source_decisions {
+    bool ends_in_run = false;              /* the last step's run of SD stanzas ends the file */
+    std::optional<std::size_t> map_before; /* index of the last class's step that the map precedes; none: at the end */
+    std::optional<std::size_t> locator_in; /* position of the class with the Locator line; none: no line */
+    std::string locator;                   /* its value */
+};
+
+/* A class, with what is planned for it. It is made when it is needed, because views are large. */
+struct class_plan {
+    cdb::resource_class view;
+    const cdb::ownership &owners;
+    std::size_t position; /* among the classes */
+    bool is_last;         /* no class follows */
+    source_decisions &whole;
+    std::vector<step> &order;
+    class_decisions &decided;
+
+    bool ends_in_run() const {
+        return is_last && whole.ends_in_run;
+    }
+    std::optional<std::size_t> map_before() const {
+        return is_last ? whole.map_before : std::nullopt;
+    }
+    std::vector<dynamic_plan> &of(cdb::level level) const {
+        return decided.of(level);
     }
     std::size_t count(table of_records) const {
         return view.record().*side_table_of(of_records).count;
@@ -116,13 +135,47 @@ struct class_plan {
     bool owns(const step &record, std::size_t field_offset) const {
         const cdb::side_table &t = side_table_of(record.from);
         std::size_t at = (view.record().*t.ref).offset[0] + record.index * t.record->size;
-        return owners->is_own(view.side_tables().section, at + field_offset);
+        return owners.is_own(view.side_tables().section, at + field_offset);
     }
     /* A class that follows in the source ends this one while the last attribute of each kind is still open: the
      * compiler writes that attribute as it is, without the checks and defaults of its completion. */
     bool is_cut_short(const step &s) const {
         return !is_last && s.from < table::class_actions && s.index + 1 == count(s.from);
     }
+};
+
+/* The plans of all classes. */
+class class_plans {
+public:
+    /* The database and its owners must stay as long as the plans. */
+    class_plans(const cdb::database &database, const cdb::ownership &ownership) : db(database), owners(ownership) {
+        cdb::sections_of<cdb::resource_class> classes = db.classes();
+        decisions.resize(static_cast<std::size_t>(std::distance(classes.begin(), classes.end())));
+    }
+
+    std::size_t size() const {
+        return decisions.size();
+    }
+    /* Calls a function with each class, in the order of the file. */
+    template <class Visit> void each(Visit visit) {
+        std::size_t position = 0;
+        for (const cdb::resource_class &c : db.classes()) {
+            class_decisions &of = decisions[position];
+            class_plan plan = {c, owners, position, position + 1 == size(), whole, of.order, of};
+            visit(plan);
+            ++position;
+        }
+    }
+    class_decisions &operator[](std::size_t position) {
+        return decisions[position];
+    }
+
+    source_decisions whole;
+
+private:
+    const cdb::database &db;
+    const cdb::ownership &owners;
+    std::vector<class_decisions> decisions;
 };
 
 /* True if all required lines can be given. Only then may optional ones follow. */

@@ -17,10 +17,14 @@ void source_writer::comment(std::string_view lines) {
 }
 
 void source_writer::stanza(std::string_view kind, const record_name &place) {
-    if (parts && text.size() >= FULL)
-        flush();
+    flush_if_full();
     text.append("\n").append(kind).append("\n");
     current = place;
+}
+
+void source_writer::flush_if_full() {
+    if (parts && text.size() >= FULL)
+        flush();
 }
 
 void source_writer::flush() {
@@ -43,6 +47,7 @@ void source_writer::optional_line(std::string_view name, std::int64_t number, st
 }
 
 void source_writer::line_of_any(std::string_view name, const std::vector<std::string> &values) {
+    flush_if_full();
     for (const std::string &value : values)
         if (append_attribute_line(text, name, value))
             return;

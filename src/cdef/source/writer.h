@@ -19,7 +19,7 @@ using part_taker = std::function<void(std::string_view)>;
 /* Its functions throw no_source_error for what no line can express. */
 class source_writer {
 public:
-    /* The text is passed on in parts, each of which ends where a stanza begins. Without a taker all of it is kept. */
+    /* The text is passed on in parts. Without a taker all of it is kept. */
     explicit source_writer(part_taker to = {}) : parts(std::move(to)) {}
 
     /* Writes each line of the text as a comment. Lines are not wrapped, so they must be short. */
@@ -33,13 +33,15 @@ public:
     /* Writes the first of several texts that fits in a line. */
     void line_of_any(std::string_view name, const std::vector<std::string> &values);
 
+    /* Passes on the text if there is much of it. For lists, which may have many lines. */
+    void flush_if_full();
     /* Passes on the rest of the text. */
     void flush();
 
     std::string text; /* which has not been passed on */
 
 private:
-    static constexpr std::size_t FULL = 65536; /* bytes of text that are passed on */
+    static constexpr std::size_t FULL = 16384; /* bytes of text that are passed on */
 
     [[noreturn]] void refuse(std::string_view name, std::optional<std::string_view> value) const;
 

@@ -2,6 +2,8 @@
  * whether the whole got faster, only script/bench tells. */
 
 #include "compiler/cdgen.h"
+#include "compiler/cdgen_swap.h"
+#include "format/checksum.h"
 
 #include <benchmark/benchmark.h>
 

@@ -224,7 +224,7 @@ def at_least(figure, limit, form):
 def memory(peak, output):
     """A verdict for peak memory compared with the size of the output."""
     finding = f"{peak / MB:.1f} MB for {output / MB:.1f} MB"
-    return Verdict(finding, "<= 2.2 x output + 2 MB", peak <= 2.2 * output + 2 * MB)
+    return Verdict(finding, "<= 1.6 x output + 2 MB", peak <= 1.6 * output + 2 * MB)
 
 
 def readers(bench):

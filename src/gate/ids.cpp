@@ -110,15 +110,17 @@ constexpr std::size_t FIELDS = 5;
 
 std::optional<std::array<std::string, FIELDS>> fields_of(std::string_view line) {
     std::array<std::string, FIELDS> fields;
-    for (std::size_t i = 0; i < FIELDS; ++i) {
-        std::size_t end = i + 1 < FIELDS ? line.find('\t') : line.size();
-        if (end == std::string_view::npos || (i + 1 == FIELDS && line.find('\t') != std::string_view::npos))
+    for (std::string &field : fields) {
+        std::size_t end = line.find('\t');
+        bool is_last = &field == &fields.back();
+        if ((end == std::string_view::npos) != is_last)
             return std::nullopt;
-        std::optional<std::string> field = unescaped(line.substr(0, end));
-        if (!field)
+        std::optional<std::string> text = unescaped(line.substr(0, end));
+        if (!text)
             return std::nullopt;
-        fields[i] = std::move(*field);
-        line.remove_prefix(std::min(end + 1, line.size()));
+        field = std::move(*text);
+        if (!is_last)
+            line.remove_prefix(end + 1);
     }
     return fields;
 }

@@ -395,9 +395,11 @@ def test_replaced_output_keeps_its_mode_and_links(world):
     check(stat.S_IMODE(os.stat(world.path(OUT)).st_mode) == 0o600, "another mode")
 
 
-def test_file_size_limit(world):
+# How many attributes; the larger database is filled with more blocks than one call writes.
+@pytest.mark.parametrize("count", [50, 5000])
+def test_file_size_limit(world, count):
     """Exceeding the limit is reported as an error, not by a signal. The test finds the lowest limit that is enough."""
-    good = world.good(HEAD + attributes(50))
+    good = world.good(HEAD + attributes(count))
     gross = -(-len(good) // BLOCK) * BLOCK
     check(gross > 4 * BLOCK, "the database is too small for the case")
     for size in (0, 1, BLOCK - 1, BLOCK, BLOCK + 1, gross - BLOCK, gross - 1):
@@ -407,9 +409,10 @@ def test_file_size_limit(world):
     check(world.read() == good, "another database")
 
 
-def test_output_is_filled_with_whole_blocks(world):
+@pytest.mark.parametrize("count", [50, 5000])
+def test_output_is_filled_with_whole_blocks(world, count):
     """The size is the smallest multiple of a block that holds the database."""
-    good = world.good(HEAD + attributes(50))
+    good = world.good(HEAD + attributes(count))
     status, *_ = ended(traced(world, "write,writev", []))
     check(status == 0, "the program cannot be traced")
     written = sum(int(count) for count in re.findall(rb"^(?:\d+ )?writev?\(.* = (\d+)$", world.read(TRACE), re.M))

@@ -3,6 +3,7 @@
 #include "check/findings.h"
 
 #include <algorithm>
+#include <tuple>
 #include <utility>
 
 namespace check {
@@ -58,19 +59,20 @@ finding *findings::waiting_error(message_id id, int line) {
 /* Sorts their positions first, because it takes long to move a finding. */
 void findings::sort() {
     struct position {
-        auto operator<=>(const position &) const = default;
-
         int line;
         bool is_warning;
         size_t index; /* among the waiting ones: equal findings stay in their order */
+    };
+    auto before = [](const position &a, const position &b) {
+        return std::tie(a.line, a.is_warning, a.index) < std::tie(b.line, b.is_warning, b.index);
     };
     std::vector<position> order;
     order.reserve(waiting.size());
     for (const entry &each : waiting)
         order.push_back({each.found.at.line, !each.found.error, order.size()});
-    if (std::is_sorted(order.begin(), order.end()))
+    if (std::is_sorted(order.begin(), order.end(), before))
         return;
-    std::sort(order.begin(), order.end());
+    std::sort(order.begin(), order.end(), before);
     std::vector<entry> sorted;
     sorted.reserve(waiting.size());
     for (const position &each : order)

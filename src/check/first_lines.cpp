@@ -7,12 +7,6 @@
 
 namespace check {
 
-namespace {
-
-constexpr size_t FEWEST_SLOTS = 64;
-
-} // namespace
-
 size_t first_lines::slot_of(std::string_view text, unsigned tag) const {
     size_t mask = slots.size() - 1;
     size_t at = tag & mask;

@@ -29,6 +29,8 @@ public:
     void clear();
 
 private:
+    static constexpr size_t FEWEST_SLOTS = 64;
+
     struct entry {
         size_t begin; /* in texts; it ends where the next one begins */
         int line;

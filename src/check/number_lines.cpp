@@ -9,8 +9,6 @@ namespace check {
 
 namespace {
 
-constexpr size_t FEWEST_SLOTS = 64;
-
 /* Numbers mostly ascend, so the slots of eight of them are close together. If the slots of more were adjacent, the
  * search for a missing number would take long. */
 size_t place_of(vx_uint32_t number) {

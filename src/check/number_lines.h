@@ -18,6 +18,8 @@ public:
     void clear();
 
 private:
+    static constexpr size_t FEWEST_SLOTS = 64;
+
     struct slot {
         vx_uint32_t number;
         int line; /* 0: the slot is free */

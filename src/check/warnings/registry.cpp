@@ -14,6 +14,7 @@
 namespace check {
 
 /* To add a warning: a class in a file of this folder, its maker, a row, its id, and an example (examples.cpp). */
+// NOLINTBEGIN(readability-redundant-declaration): the files that define them may be read in one unit with this one
 maker make_carriage_return, make_class_bit, make_comma_list, make_comment_in_value, make_cut_short, make_element_type,
     make_group, make_ignored_range, make_incomplete, make_intervals, make_invalid_default, make_long_line,
     make_lost_bytes, make_low_above_high, make_narrowed, make_no_expression, make_no_name, make_no_resource_class,
@@ -21,6 +22,7 @@ maker make_carriage_return, make_class_bit, make_comma_list, make_comment_in_val
     make_range_elsewhere, make_same_id, make_same_name, make_sd_run_at_end, make_sd_without_run,
     make_second_resource_class, make_stray_run, make_text_after_quote, make_unbalanced, make_unknown_locator,
     make_unknown_variable_class, make_unused_default, make_unused_variable_class;
+// NOLINTEND(readability-redundant-declaration)
 
 namespace {
 

@@ -67,7 +67,7 @@ private:
     void column_1_attribute(finding &error, std::string_view text);
     void lose_stanza();
 
-    /* Attribute lines (recover_attribute.cpp). */
+    /* Attributes that have been taken (note_attribute.cpp). */
     void note_given();
     void note_mapping_or_variable_class(bool first);
     void note_value();
@@ -76,6 +76,8 @@ private:
     void declare_id();
     void note_refused(const std::optional<int> &attr_type);
     void take_quietly(std::string_view text, size_t added);
+
+    /* Attribute lines (recover_attribute.cpp). */
     void recover_attribute(const fatal_exit &failure);
     void settle_split();
     language::guess header_meant(const fatal_exit &failure) const;

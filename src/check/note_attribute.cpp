@@ -5,49 +5,12 @@
 
 namespace check {
 
-/* This and note_value() are called for nearly every line. They leave to other functions what few lines need. */
-void recovery::note_given() {
-    const attr_place &latest = compiler.latest();
-    if (latest.attr == nullptr)
-        return;
-    stanza_record &stanza = known.stanza();
-    int &given = stanza.given[static_cast<size_t>(latest.attr - table_of(known.kind).sc_attrs.data())];
-    bool first = given == 0;
-    if (first) {
-        given = line.number;
-        stanza.suspect = false;
-    }
-    if (known.kind == SC_CLASS_TO_MANAGER_MAPPING || known.kind == SC_RESOURCE_VARIABLE_CLASS)
-        note_mapping_or_variable_class(first);
-    if (latest.attr->ta_type == AT_SD_INDEX)
-        index_lost = false;
-}
-
 void recovery::note_mapping_or_variable_class(bool first) {
     std::string_view name = name_of(see.attr());
     if (known.kind == SC_CLASS_TO_MANAGER_MAPPING)
         known.map_values.push_back({see.value_place(), std::string(name), std::string(line.raw)});
     else if (first && name == "VariableClass")
         known.variable_class_names.push_back(see.value_mention());
-}
-
-void recovery::note_value() {
-    switch (see.attr().ta_type) {
-    case AT_STRING:
-    case AT_SD_NAME:
-        if (known.declared.keeps_names)
-            declare_name();
-        return;
-    case AT_ID:
-        if (known.declared.keeps_ids)
-            declare_id();
-        return;
-    case AT_DATA_TYPE:
-    case AT_SD_DATA_TYPE:
-        return note_data_type();
-    default:
-        return;
-    }
 }
 
 /* In place, since this is done for each attribute and element. */

@@ -115,6 +115,44 @@ private:
     int awaited_index = -1;  /* after a wrong index: the one that was expected instead, which may follow; -1: none */
 };
 
+/* note_given() and note_value() are inline because they are called for nearly every line. They leave to other functions
+ * what few lines need. */
+inline void recovery::note_given() {
+    const attr_place &latest = compiler.latest();
+    if (latest.attr == nullptr)
+        return;
+    stanza_record &stanza = known.stanza();
+    int &given = stanza.given[static_cast<size_t>(latest.attr - table_of(known.kind).sc_attrs.data())];
+    bool first = given == 0;
+    if (first) {
+        given = line.number;
+        stanza.suspect = false;
+    }
+    if (known.kind == SC_CLASS_TO_MANAGER_MAPPING || known.kind == SC_RESOURCE_VARIABLE_CLASS)
+        note_mapping_or_variable_class(first);
+    if (latest.attr->ta_type == AT_SD_INDEX)
+        index_lost = false;
+}
+
+inline void recovery::note_value() {
+    switch (see.attr().ta_type) {
+    case AT_STRING:
+    case AT_SD_NAME:
+        if (known.declared.keeps_names)
+            declare_name();
+        return;
+    case AT_ID:
+        if (known.declared.keeps_ids)
+            declare_id();
+        return;
+    case AT_DATA_TYPE:
+    case AT_SD_DATA_TYPE:
+        return note_data_type();
+    default:
+        return;
+    }
+}
+
 } // namespace check
 
 #endif

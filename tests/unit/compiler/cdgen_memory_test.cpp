@@ -168,7 +168,7 @@ TEST_F(LargeTables, FiledOnesAreDroppedInTheReverseOrder) {
     }
     EXPECT_TRUE(has_pages(latest));
     const char *next = staged_content(filed(8))->tbl_base;
-    EXPECT_EQ(staged_content(filed(8))->tbl_base, next + sizeof(tbl_content) + 8);
+    EXPECT_EQ(staged_content(filed(8))->tbl_base, next + round8(sizeof(tbl_content) + 8));
     expect_filled(*staged_content(kept));
 }
 

@@ -210,7 +210,7 @@ void *tbl_at(tbl_content *t, size_t offset, size_t size) {
 
 /* A pool grows by chunks for the values of several lines, each twice as large as the one before, up to a size that is
  * worth giving back. What is large gets a chunk of its own. clear() keeps the latest chunk for reuse. */
-struct text_pool::chunk {
+struct alignas(vx_value_t) text_pool::chunk {
     chunk *before;
     chunk *after;
     size_t size; /* bytes that follow */
@@ -309,10 +309,11 @@ void text_pool::clear() {
 namespace {
 
 tbl_content *keep_copy(filed_contents &to, const tbl &t) {
-    char *content = to.pool.take(sizeof(tbl_content) + t.used());
+    constexpr size_t BEFORE_BYTES = round8(sizeof(tbl_content));
+    char *content = to.pool.take(BEFORE_BYTES + t.used());
     if (content == nullptr)
         table_failure(t, MSG_NO_MEMORY_FOR_TABLE);
-    char *bytes = content + sizeof(tbl_content);
+    char *bytes = content + BEFORE_BYTES;
     memcpy(bytes, t.tbl_base, t.used());
     return new (content) tbl_content{bytes, bytes + t.used(), t.tbl_name, memory_owner::POOL};
 }

@@ -30,6 +30,7 @@ struct bare_value {
 [[gnu::noinline]] bare_value unquoted(cdgen &cx, attr_text text, char *equals) {
     char *value = equals + 1;
     char *end = text.end;
+    *end = '\0';
     if (value[0] == '"' && value[1] == '"' && value[2] == '\0')
         return {nullptr, end};
     value = strip_quotes(value, &end);
@@ -69,6 +70,7 @@ void observe(const cdgen &cx, const table_attrs &attr, bare_value value) {
 /* Reports a line of a stanza that is watched. */
 [[gnu::noinline]] void watch(const cdgen &cx, const table_attrs &attr, bare_value value) {
     observe(cx, attr, value);
+    *value.end = '\0';
     if (cx.options.debugLevel >= 2)
         printf("%s: found attr: \"%s\", value: \"%s\",length: %d\n", cx.framing.scp->sc_name, attr.ta_name, value.text,
                static_cast<int>(value.end - value.text));
@@ -103,7 +105,6 @@ void count_required(cdgen &cx, const table_attrs &attr) {
 
 void save_attr_line(cdgen &cx, attr_text text) {
     const table_attrs *attr = cx.framing.state->order.expected(*cx.framing.scp, text.name);
-    *text.end = '\0'; /* not before: reading a byte that has just been written, in a word with others, takes long */
     if (attr == nullptr)
         cx.source.point_at(text.line, text.name);
     if (attr == nullptr && text.name == text.end)

@@ -8,7 +8,7 @@
 struct attr_line {
     cdgen &cx;
     const table_attrs &attr;
-    char *value; /* not empty; may be taken apart */
+    char *value; /* not empty; may be taken apart; has a NUL at its end only where its handler wants one */
     size_t length;
 };
 

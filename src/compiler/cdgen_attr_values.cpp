@@ -53,15 +53,16 @@ tbl *strings_of(const attr_line &line) {
 /* ---- Plain values ---------------------------------------------------------------------------------------------- */
 
 /* For numbers that only the C library reads, and for texts that are not numbers. */
-template <class Width> [[gnu::noinline]] void store_other_integer(cdgen &cx, char *field, std::string_view value) {
-    store(field, static_cast<Width>(int_from_text(cx, value, nullptr, 0)));
+template <class Width> [[gnu::noinline]] void store_other_integer(cdgen &cx, char *field, char *value, size_t length) {
+    value[length] = '\0';
+    store(field, static_cast<Width>(int_from_text(cx, {value, length}, nullptr, 0)));
 }
 
 /* Deliberately truncated to the field's width, without a range check. */
 template <class Width> void store_integer(const attr_line &line) {
     vx_uint64_t plain = 0;
     if (!plain_decimal(value_of(line), &plain))
-        return store_other_integer<Width>(line.cx, field_of(line), value_of(line));
+        return store_other_integer<Width>(line.cx, field_of(line), line.value, line.length);
     store(field_of(line), static_cast<Width>(plain));
 }
 
@@ -387,43 +388,51 @@ using handler = void (*)(cdgen &cx, const table_attrs &attr, char *value, size_t
 /* The function as a handler. A line has four words, which a handler gets in registers. */
 template <void (*store)(const attr_line &)>
 void stored_by(cdgen &cx, const table_attrs &attr, char *value, size_t length) {
+    value[length] = '\0';
+    store({cx, attr, value, length});
+}
+
+/* The same for a function that needs no NUL at the value's end. It reads words, and a word that contains a byte that
+ * has just been written is read slowly. */
+template <void (*store)(const attr_line &)>
+void stored_by_length(cdgen &cx, const table_attrs &attr, char *value, size_t length) {
     store({cx, attr, value, length});
 }
 
 /* By attr_type. */
 constexpr std::array<handler, AT_COUNT> handlers = {
-    stored_by<store_integer<uint8_t>>,     /* AT_UINT8 */
-    stored_by<store_integer<vx_uint16_t>>, /* AT_UINT16 */
-    stored_by<store_integer<vx_uint32_t>>, /* AT_UINT32 */
-    stored_by<store_string>,               /* AT_STRING */
-    stored_by<store_class_props>,          /* AT_CLASS_PROPS */
-    stored_by<store_version>,              /* AT_VERSION */
-    stored_by<store_perm_template>,        /* AT_PERM_TEMPLATE */
-    stored_by<store_manager>,              /* AT_MANAGER */
-    stored_by<store_locator>,              /* AT_LOCATOR */
-    stored_by<store_integer<vx_uint32_t>>, /* AT_ID */
-    stored_by<store_variety>,              /* AT_VARIETY */
-    stored_by<store_pattr_props>,          /* AT_PATTR_PROPS */
-    stored_by<store_dattr_props>,          /* AT_DATTR_PROPS */
-    stored_by<store_action_props>,         /* AT_ACTION_PROPS */
-    stored_by<store_valid_value>,          /* AT_VALID_VALUE */
-    stored_by<store_default>,              /* AT_DEFAULT_VALUE */
-    stored_by<store_value_display>,        /* AT_VALUE_DISPLAY */
-    stored_by<store_data_type>,            /* AT_DATA_TYPE */
-    stored_by<store_variable_type>,        /* AT_VARIABLE_TYPE */
-    stored_by<store_range>,                /* AT_RANGE */
-    stored_by<store_default>,              /* AT_INITIAL_VALUE */
-    stored_by<check_sd_index>,             /* AT_SD_INDEX */
-    stored_by<store_sd_name>,              /* AT_SD_NAME */
-    stored_by<store_sd_description>,       /* AT_SD_DESCRIPTION */
-    stored_by<store_sd_display>,           /* AT_SD_DISPLAY */
-    stored_by<store_sd_data_type>,         /* AT_SD_DATA_TYPE */
-    stored_by<store_sd_valid_value>,       /* AT_SD_VALID_VALUE */
-    stored_by<store_value_display>,        /* AT_SD_VALUE_DISPLAY */
-    stored_by<refuse_sd_default>,          /* AT_SD_DEFAULT_VALUE */
-    stored_by<ignore>,                     /* AT_LIST_ACTION_CLASS */
-    stored_by<ignore>,                     /* AT_LIST_ACTION_RSRC */
-    stored_by<store_permission>,           /* AT_PERMISSION */
+    stored_by_length<store_integer<uint8_t>>,     /* AT_UINT8 */
+    stored_by_length<store_integer<vx_uint16_t>>, /* AT_UINT16 */
+    stored_by_length<store_integer<vx_uint32_t>>, /* AT_UINT32 */
+    stored_by<store_string>,                      /* AT_STRING */
+    stored_by_length<store_class_props>,          /* AT_CLASS_PROPS */
+    stored_by<store_version>,                     /* AT_VERSION */
+    stored_by<store_perm_template>,               /* AT_PERM_TEMPLATE */
+    stored_by<store_manager>,                     /* AT_MANAGER */
+    stored_by<store_locator>,                     /* AT_LOCATOR */
+    stored_by_length<store_integer<vx_uint32_t>>, /* AT_ID */
+    stored_by<store_variety>,                     /* AT_VARIETY */
+    stored_by_length<store_pattr_props>,          /* AT_PATTR_PROPS */
+    stored_by_length<store_dattr_props>,          /* AT_DATTR_PROPS */
+    stored_by_length<store_action_props>,         /* AT_ACTION_PROPS */
+    stored_by<store_valid_value>,                 /* AT_VALID_VALUE */
+    stored_by<store_default>,                     /* AT_DEFAULT_VALUE */
+    stored_by<store_value_display>,               /* AT_VALUE_DISPLAY */
+    stored_by<store_data_type>,                   /* AT_DATA_TYPE */
+    stored_by<store_variable_type>,               /* AT_VARIABLE_TYPE */
+    stored_by<store_range>,                       /* AT_RANGE */
+    stored_by<store_default>,                     /* AT_INITIAL_VALUE */
+    stored_by<check_sd_index>,                    /* AT_SD_INDEX */
+    stored_by<store_sd_name>,                     /* AT_SD_NAME */
+    stored_by<store_sd_description>,              /* AT_SD_DESCRIPTION */
+    stored_by<store_sd_display>,                  /* AT_SD_DISPLAY */
+    stored_by<store_sd_data_type>,                /* AT_SD_DATA_TYPE */
+    stored_by<store_sd_valid_value>,              /* AT_SD_VALID_VALUE */
+    stored_by<store_value_display>,               /* AT_SD_VALUE_DISPLAY */
+    stored_by<refuse_sd_default>,                 /* AT_SD_DEFAULT_VALUE */
+    stored_by_length<ignore>,                     /* AT_LIST_ACTION_CLASS */
+    stored_by_length<ignore>,                     /* AT_LIST_ACTION_RSRC */
+    stored_by<store_permission>,                  /* AT_PERMISSION */
 };
 
 } // namespace

@@ -41,6 +41,14 @@ char *reserve(size_t needed, size_t *size) {
     return space == MAP_FAILED ? nullptr : static_cast<char *>(space);
 }
 
+void take_reserved_pages([[maybe_unused]] char *begin, [[maybe_unused]] size_t size) {
+#ifdef MADV_POPULATE_WRITE
+    int before = errno;
+    madvise(begin, size, MADV_POPULATE_WRITE);
+    errno = before;
+#endif
+}
+
 size_t give_back(char *reserved, size_t size, size_t kept) {
     static const auto page = static_cast<size_t>(sysconf(_SC_PAGESIZE));
     size_t remaining = std::min(size, (kept + page - 1) / page * page);

@@ -16,8 +16,15 @@ enum class memory_owner {
  * a partly used page does not matter. */
 constexpr size_t RESERVE_FROM = size_t{1} << 18;
 
-/* What has been written to the image is given back in pieces of this many bytes, whole pages. */
-constexpr size_t PIECE = size_t{1} << 16;
+/* Tables are given back, while the image takes them, in pieces of this many bytes, whole pages. */
+constexpr size_t PIECE = size_t{1} << 18;
+
+/* A table in reserved address space gets this many bytes of pages at once. That takes less time than getting each page
+ * when it is first written. */
+constexpr size_t STRETCH = size_t{1} << 17;
+
+/* A pool takes pages for chunks of this many bytes and more. */
+constexpr size_t PAGED_CHUNK = size_t{1} << 16;
 
 /* Takes zero-filled pages with at least this many bytes, which give_back() returns to the system at once, unlike
  * free(). Returns null, with errno, if there is no memory. */
@@ -25,6 +32,8 @@ char *take_pages(size_t size);
 /* Reserves address space of at least this many bytes; *size is how many. Returns null where address space is scarce: on
  * 32-bit machines, and if the process has a memory limit. */
 char *reserve(size_t needed, size_t *size);
+/* Takes the pages of this part of a reservation from the system. If it cannot, each comes when it is first written. */
+void take_reserved_pages(char *begin, size_t size);
 /* Gives back all of a reservation but its first bytes, rounded up to whole pages; returns how many remain. */
 size_t give_back(char *reserved, size_t size, size_t kept = 0);
 

@@ -128,6 +128,14 @@ bool take_block(tbl &t, size_t needed) {
     return t.tbl_owner == memory_owner::HEAP && take_from_heap(t, needed);
 }
 
+/* Prepares the pages for the bytes that the table grows by. */
+void take_stretches(const tbl &t, size_t size) {
+    size_t taken = (t.tbl_size + STRETCH - 1) / STRETCH * STRETCH;
+    size_t needed = std::min((size + STRETCH - 1) / STRETCH * STRETCH, t.tbl_capacity);
+    if (needed > taken)
+        take_reserved_pages(t.tbl_base + taken, needed - taken);
+}
+
 [[noreturn]] void table_failure(const tbl &t, message_id what) {
     int error = errno;
     cdgen_error_exit(what, t.tbl_name, strerror(error), 0, error);
@@ -159,6 +167,8 @@ void grow(cdgen &cx, tbl &t, size_t s) {
     t.tbl_next = t.tbl_base + used;
     if (t.tbl_owner == memory_owner::HEAP)
         memset(t.tbl_base + t.tbl_size, 0, chunk);
+    else if (t.tbl_owner == memory_owner::RESERVED)
+        take_stretches(t, size);
     t.tbl_size = size;
     t.tbl_end = t.tbl_base + size;
     if (cx.options.debugLevel > 2)
@@ -237,7 +247,7 @@ struct alignas(vx_value_t) text_pool::chunk {
 
 private:
     static bool has_pages(size_t size) {
-        return sizeof(chunk) + size >= PIECE;
+        return sizeof(chunk) + size >= PAGED_CHUNK;
     }
 };
 
@@ -251,9 +261,9 @@ text_pool::~text_pool() {
 }
 
 bool text_pool::add_chunk(size_t n) {
-    constexpr size_t LARGEST = 2 * PIECE - sizeof(chunk);
+    constexpr size_t LARGEST = 2 * PAGED_CHUNK - sizeof(chunk);
     size_t usual = latest == nullptr ? POOL_CHUNK : std::min(2 * latest->size, LARGEST);
-    size_t size = n > PIECE ? n : std::max(n, usual);
+    size_t size = n > PAGED_CHUNK ? n : std::max(n, usual);
     chunk *fresh = chunk::make(size);
     if (fresh == nullptr)
         return false;

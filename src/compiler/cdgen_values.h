@@ -45,7 +45,7 @@ int oct_convert(cdgen &cx, const char *p, int type, char *out_buf);
  * NUL over the closing quote. The text must end, with a NUL, at *end, which becomes the end of what is returned. */
 char *strip_quotes(char *s, char **end);
 /* ORs the bits of the properties named in a comma-separated list, which it takes apart, into *dest. An unknown name is
- * fatal. The list ends with a NUL; seven bytes after it may be read. */
+ * fatal. A NUL is written at its end; seven more bytes may be read. */
 void set_props(vx_uint32_t *dest, std::span<const props_t> props, char *list, size_t length);
 /* Packs up to four dotted numbers into *n; always 0. */
 int ver_str_convert(cdgen &cx, const char *ver_str, vx_uint32_t *n);

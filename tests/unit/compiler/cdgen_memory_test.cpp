@@ -116,6 +116,25 @@ TEST_F(LargeTables, UntracedRestartIsAFirstReservationOfNoBytes) {
     EXPECT_EQ(std::string(static_cast<char *>(alloc_tble(cx, &t, 150)), 150), std::string(150, '\0'));
 }
 
+TEST_F(LargeTables, GetTheirPagesInStretches) {
+    size_t size = 0;
+    char *space = reserve(STRETCH, &size);
+    if (space == nullptr)
+        GTEST_SKIP() << "address space is limited";
+    take_reserved_pages(space, STRETCH);
+    bool can_take = has_pages(space);
+    give_back(space, size);
+    if (!can_take)
+        GTEST_SKIP() << "the system gives pages only when they are written";
+    tbl t(8192, "Records");
+    for (size_t filled : {4 * RESERVE_FROM + 8192, 4 * RESERVE_FROM + 3 * STRETCH - 8192}) {
+        fill(t, filled);
+        const char *end = t.tbl_base + (filled + STRETCH - 1) / STRETCH * STRETCH;
+        EXPECT_TRUE(has_pages(end - 1));
+        EXPECT_FALSE(has_pages(end));
+    }
+}
+
 TEST_F(LargeTables, AreGivenBackPieceByPiece) {
     if (!may_reserve())
         GTEST_SKIP() << "address space is limited";
@@ -147,7 +166,7 @@ TEST_F(LargeTables, PartsOfAPoolStay) {
 TEST_F(LargeTables, FiledOnesAreGivenBackInTheirOrder) {
     std::vector<cdb_ref_t> refs;
     for (size_t i = 0; i < 100; ++i)
-        refs.push_back(filed(PIECE / 8));
+        refs.push_back(filed(PAGED_CHUNK / 8));
     const char *early = staged_content(refs[60])->tbl_base;
     give_back_filed_before(cx.store.of_classes, refs[99]);
     EXPECT_FALSE(has_pages(early));
@@ -158,8 +177,8 @@ TEST_F(LargeTables, FiledOnesAreGivenBackInTheirOrder) {
 
 TEST_F(LargeTables, FiledOnesAreDroppedInTheReverseOrder) {
     cdb_ref_t kept = filed(8);
-    const char *latest = staged_content(filed(2 * PIECE))->tbl_base;
-    for (size_t length : {size_t{3000}, 2 * PIECE, 2 * RESERVE_FROM}) {
+    const char *latest = staged_content(filed(2 * PAGED_CHUNK))->tbl_base;
+    for (size_t length : {size_t{3000}, 2 * PAGED_CHUNK, 2 * RESERVE_FROM}) {
         std::vector<cdb_ref_t> refs;
         for (size_t i = 0; i < 50; ++i)
             refs.push_back(filed(length));

@@ -86,7 +86,7 @@ def list_of_columns(head, rows):
     """A table that is too wide: below the first column the middle ones with their headings, then the last."""
     out = headings(head[0], head[-1])
     for row in rows:
-        middle = "; ".join(filter(None, map(named, head[1:-1], row[1:-1])))
+        middle = re.sub(r"\.;", ";", "; ".join(filter(None, map(named, head[1:-1], row[1:-1]))))
         last = inline(row[-1]) if head[-1] in PLAIN_HEADINGS else named(head[-1], row[-1])
         out += [".TP", at_line_start(inline(row[0])) or "\\&", *([at_line_start(middle), ".br"] if middle else []),
                 *sentences(last or "\\&")]

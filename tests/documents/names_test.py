@@ -87,6 +87,12 @@ class Language(Names):
                                    " ".join(form))
         self.assertEqual(said, known)
 
+    def test_each_attribute_has_a_row_about_its_checks(self):
+        """Who checks its values: the compiler, `cdef check`, or somebody else."""
+        rows = tables(dict(chapters(LANGUAGE, 2))["Numbers and who checks them"])[0][1:]
+        listed = {name for row in rows for name in spans(row[0])}
+        self.assertEqual(listed, {name for stanza, name, *_ in self.names["attribute"]})
+
     def test_attributes_are_in_their_usual_order(self):
         """That of `cdef format --reorder`, which the language server shows."""
         with Client() as client:

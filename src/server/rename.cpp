@@ -81,7 +81,7 @@ const check::finding *new_finding(const std::vector<check::finding> &before, con
 
 void require_writable(const place_in_source &place, const named &old, const std::string &name) {
     if (name.empty() || name.find_first_of(std::string_view("\n\r\0", 3)) != std::string::npos)
-        throw request_error(REQUEST_FAILED, "this is no name");
+        throw request_error(REQUEST_FAILED, "this is not a name");
     if (!source_index::has_value("\ta=\"" + name + "\"", name))
         throw request_error(REQUEST_FAILED, "a source cannot have " + language::quoted(name) + " as a name");
     if (old.in_expressions && !source_index::is_expression_name(name))

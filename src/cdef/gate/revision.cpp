@@ -66,7 +66,7 @@ revision::revision(std::string called, std::string in, const std::string &about)
         return;
     std::size_t end = said ? said->find_last_of('\n', said->size() - 2) : std::string::npos;
     if (end == std::string::npos)
-        throw failure(about + ": no git repository has it, or its repository has no revision " + name);
+        throw failure(about + ": not in a git repository, or the repository has no revision " + name);
     prefix = said->substr(0, end);
     tree = said->substr(end + 1, said->size() - end - 2);
 }

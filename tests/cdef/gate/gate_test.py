@@ -399,7 +399,7 @@ def test_takes_all_classes_as_new_before_the_first_commit(world):
     repository = world.path("r")
     for against, operand in (("git:HEAD", "p/a.cdefsrc"), ("git:HEAD", "p")):
         expect(world.inspect("gate", "--against", against, operand, cwd=repository), 0)
-    refused = b"cdef: p/a.cdefsrc: no git repository has it, or its repository has no revision "
+    refused = b"cdef: p/a.cdefsrc: not in a git repository, or the repository has no revision "
     expect(world.inspect("gate", "--against=git:v1", "p/a.cdefsrc", cwd=repository), 2, refused + b"v1\n")
     git(world, "commit", "-qm", "nothing", "--allow-empty", cwd=repository)
     for each in world.path("r/.git/objects").glob("??/*"):
@@ -462,7 +462,7 @@ def test_refuses_older_versions_that_are_not_there(world):
     expect(world.inspect("gate", "--against=git:-x", "a.cdefsrc"), 2, b"cdef: --against git:-x: not a revision\n")
     expect(world.inspect("gate", "--against=git:HEAD:", "a.cdefsrc"), 2, b"cdef: --against git:HEAD:: expected a path after "
            b"the second colon; ./ is the class's directory\n")
-    missing = b"cdef: a.cdefsrc: no git repository has it, or its repository has no revision HEAD\n"
+    missing = b"cdef: a.cdefsrc: not in a git repository, or the repository has no revision HEAD\n"
     expect(world.inspect("gate", "--against=git:HEAD", "a.cdefsrc"), 2, missing)
     without_git = world.inspect("gate", "--against=git:HEAD", "a.cdefsrc", env={"PATH": "/nowhere"})
     check(without_git.returncode == 2 and b"cdef: git: cannot run: " in without_git.stderr, without_git)

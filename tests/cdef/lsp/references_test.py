@@ -104,7 +104,7 @@ def test_rename_as_a_difference(pump, directory, words, new, lines_shown):
 
 @pytest.mark.parametrize("words, new, why", [
     ("Name=Ho|st", "Speed", "S"), ("Name=Ho|st", "a b", "an expression uses the name"),
-    ("Name=Ho|st", "", "no name"), ("Name=St|op", "a\nb", "no name"), ("Name=Ho|st", "Speed ", "expression"),
+    ("Name=Ho|st", "", "not a name"), ("Name=St|op", "a\nb", "not a name"), ("Name=Ho|st", "Speed ", "expression"),
     ("Name=St|op", "a\\", "cannot have"), ("Name=St|op", " a", "S"),
 ])
 def test_rename_that_would_harm_is_refused(pump, words, new, why):

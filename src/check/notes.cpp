@@ -130,7 +130,7 @@ void incomplete(noting &n) {
 }
 
 void no_class(noting &n) {
-    n.add_here("`ControlDefinition` begins a class, and must stand in front");
+    n.add_here("`ControlDefinition` begins a class and must come first");
 }
 
 void second_map(noting &n) {

@@ -220,13 +220,13 @@ std::string_view recovery::bare_header(finding &error, std::string_view name) {
     };
     if (line.raw.starts_with(BYTE_ORDER_MARK)) {
         name.remove_prefix(BYTE_ORDER_MARK.size());
-        add("a byte order mark is in front, which belongs to the name",
+        add("the line begins with a byte order mark, which belongs to the name",
             line.replacement({line.number, 1, BYTE_ORDER_MARK.size()}, line.raw, {}));
     }
     if (std::optional<edit> removal = line.without_returns(); removal && name.ends_with('\r')) {
         strip_returns = true;
         name = name.substr(0, name.find_last_not_of('\r') + 1);
-        add("the line ends with a carriage return, which belongs to the name; further ones are passed over",
+        add("the line ends with a carriage return, which belongs to the name; further ones are not reported",
             std::move(*removal));
     }
     return name;

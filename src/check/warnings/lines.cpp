@@ -17,9 +17,10 @@ public:
 
     void continued_line(const view &see) override {
         if (latest_piece != see.line.number - 1)
-            report({see.line.number - 1, 0, 0}, {},
-                   "line of more than " + std::to_string(LINE_MAX_CHARS - 1) +
-                       " characters: the rest is read as a line of its own, and later lines count one more");
+            report(
+                {see.line.number - 1, 0, 0}, {},
+                "line of more than " + std::to_string(LINE_MAX_CHARS - 1) +
+                    " characters: the rest is read as a line of its own, so the numbers of later lines are too high");
         latest_piece = see.line.number;
     }
 

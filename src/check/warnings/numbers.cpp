@@ -39,7 +39,7 @@ public:
             report(see, place_of(see, part), "no number: it is read as 0");
         else if (!n.rest().empty())
             report(see, place_of(see, part),
-                   "only the number in front counts: it is read as " + std::to_string(n.value));
+                   "text after the number is ignored: the value is " + std::to_string(n.value));
     }
 };
 

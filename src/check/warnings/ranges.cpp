@@ -81,7 +81,7 @@ private:
             of(SC_DYNAMIC_RESOURCE_ATTRIBUTE).given.reset(); /* replaced, which this warning says */
             advise(report(see, see.text_place(), "this Range goes to the `DynamicResourceAttribute` that is still open",
                           {see.known.stanzas[SC_DYNAMIC_RESOURCE_ATTRIBUTE].header, "begun here"}),
-                   "put dynamic class attributes in front of those of resources");
+                   "put dynamic class attributes before dynamic resource attributes");
         } else {
             of(see.known.kind).given = range{see.text_place(), std::string(see.line.raw)};
         }
@@ -108,7 +108,8 @@ private:
                           keeps ? "because of this Range, a " + name + " that is completed first has the range 0 to 0"
                                 : "this Range is lost: a " + name + " is completed first",
                           {mine.first->begin, "begun here"}),
-                   "put dynamic class attributes in front of those of resources, one without a Range last");
+                   "put dynamic class attributes before dynamic resource attributes, and give the last class attribute "
+                   "no `Range`");
         }
         of(kind) = {};
     }

@@ -184,8 +184,8 @@ constexpr row rows[] = {
       "Remove it. Quote a value that has to begin with a blank."},
      make_outer_blank},
     {{UNBALANCED, "S537", "unbalanced", "an expression lacks a parenthesis or a quote",
-      "An `Expression` or `ReArmExpression` has a parenthesis or a quote without its partner. After a backslash, a "
-      "quote counts, a parenthesis does not.",
+      "An `Expression` or `ReArmExpression` has a parenthesis or a quote without its partner. A quote after a "
+      "backslash counts; a parenthesis after one does not.",
       "Add the missing character, or remove this one."},
      make_unbalanced},
     {{INCOMPLETE, "S515", "incomplete", "a stanza lacks required attributes",
@@ -197,9 +197,9 @@ constexpr row rows[] = {
       "An attribute of type `SD` or `SDArray` is not directly followed by its elements.",
       "Put them directly after it."},
      make_sd_without_run},
-    {{SD_RUN_AT_END, "S501", "sd-run-at-end", "the run of an SD-typed attribute ends the file",
-      "The elements of an attribute of structured data end the file. The attribute is completed before "
-      "them, so it has no value and no highest index.",
+    {{SD_RUN_AT_END, "S501", "sd-run-at-end", "the elements of an SD-typed attribute end the file",
+      "The elements of an attribute of structured data are the last stanzas of the file. The attribute is completed "
+      "before them, so it has no value and no highest index.",
       "Put another stanza after them, for example by moving the elements up."},
      make_sd_run_at_end},
     {{STRAY_RUN, "S518", "stray-run", "elements do not belong to what they follow",

@@ -49,7 +49,7 @@ private:
         finding &about = report(parts.control->at, parts.control->source,
                                 "the class has no `ResourceClass`: its properties and message numbers are 0");
         if (parts.early.line != 0)
-            about.notes.push_back({parts.early, "`ControlDefinition` clears this one: put it after"});
+            about.notes.push_back({parts.early, "this stanza is lost: put it after the `ControlDefinition`"});
         else
             advise(about, "add a `ResourceClass` after it");
     }
@@ -63,11 +63,13 @@ public:
 
     void before_step(const view &see, int next_kind) override {
         if (next_kind == SC_RESOURCE_CLASS && parts.control && parts.resource_class.line != 0)
-            advise(report(see, see.line.all(),
-                          "the class has a `ResourceClass` already: this one replaces what both give, and adds its "
-                          "properties",
-                          {parts.resource_class, "the other one"}),
-                   "combine the two");
+            advise(
+                report(
+                    see, see.line.all(),
+                    "the class already has a `ResourceClass`: values of this one replace those of the first, and its "
+                    "properties are added",
+                    {parts.resource_class, "the other one"}),
+                "combine the two");
         parts.take_header(see, next_kind);
     }
 

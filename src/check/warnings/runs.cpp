@@ -76,7 +76,7 @@ public:
         bool settled = latest.is_settled(next_kind);
         if (settled && latest.has_run && see.line.ended && see.compiler.run_makes_value())
             advise(report(latest.header.at, latest.header.source,
-                          "the elements end the file: the attribute is completed before them and has no value"),
+                          "the elements of this attribute are the last stanzas of the file, so it has no value"),
                    "put another stanza after the elements");
     }
 

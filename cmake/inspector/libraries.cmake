@@ -1,0 +1,15 @@
+# The libraries that the inspector needs and the compiler does not: for options, for JSON and for TOML. Sets
+# missing_libraries to the names of those that are not found.
+find_package(CLI11 CONFIG)
+find_package(nlohmann_json CONFIG)
+find_path(TOMLPLUSPLUS_INCLUDE_DIR toml++/toml.h)
+set(missing_libraries)
+if(NOT CLI11_FOUND)
+  list(APPEND missing_libraries CLI11)
+endif()
+if(NOT nlohmann_json_FOUND)
+  list(APPEND missing_libraries nlohmann_json)
+endif()
+if(NOT TOMLPLUSPLUS_INCLUDE_DIR)
+  list(APPEND missing_libraries toml++)
+endif()

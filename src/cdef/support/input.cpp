@@ -114,8 +114,14 @@ std::optional<cdb::finding> readability::first_of(std::string_view code) const {
     return found == errors.end() ? std::nullopt : std::optional(*found);
 }
 
+void require_database(const input &in) {
+    if (is_text(in.contents))
+        throw failure(in.name + ": a text, not a database; 'cdef check' checks sources");
+}
+
 /* There may be millions of findings, of which only a few matter. */
 readability require_readable(const input &in) {
+    require_database(in);
     std::vector<std::size_t> strays;
     std::vector<cdb::finding> errors;
     cdb::verify(in.db, [&](cdb::finding &&f) {

@@ -34,6 +34,9 @@ bool is_text(const std::vector<std::byte> &contents);
  * nothing is read. "-" is standard input. */
 bool is_database(const std::string &path);
 
+/* Throws failure for a text, and names the subcommand that checks it. */
+void require_database(const input &in);
+
 /* The result of verifying a readable database. */
 struct readability {
     cdb::ownership owners;
@@ -42,8 +45,8 @@ struct readability {
     std::optional<cdb::finding> first_of(std::string_view code) const;
 };
 
-/* Throws failure if the records and values of the database are not reliable. Only a wrong checksum and padding that is
- * not zero are accepted. */
+/* Throws failure for a text, and if the records and values of the database are not reliable. Only a wrong checksum and
+ * padding that is not zero are accepted. */
 readability require_readable(const input &in);
 
 /* The same, and reports on standard error which of these two errors it has, each once. For subcommands whose output

@@ -61,8 +61,7 @@ void show_many(const cdb::database &db, std::size_t count, const verify_options 
 /* Shows the findings in one file; whether it passes. */
 bool judge(const std::string &path, const verify_options &options, verify::form &form) {
     input in(path);
-    if (is_text(in.contents))
-        throw failure(path + ": a text, not a database; 'cdef check' checks sources");
+    require_database(in);
     cdb::first_findings first = cdb::find_first(in.db, MOST_DIAGNOSED);
     bool pass = options.warnings_count ? first.count == 0 : first.sound;
     form.begin_file(path, pass);

@@ -262,6 +262,18 @@ class Input(unittest.TestCase):
                 self.assertEqual((status, messages), (1, ""))
                 self.assertIn("[CDB101]", output)
 
+    def test_a_source_belongs_to_check_in_all_subcommands_that_read_databases(self):
+        expected = "cdef: a.cdefsrc: a text, not a database; 'cdef check' checks sources\n"
+        with tempfile.TemporaryDirectory() as directory:
+            (pathlib.Path(directory) / "a.cdefsrc").write_text("ControlDefinition\n\tFileVersion=1\n")
+            sound = PROGRAMS.images / SOUND
+            for words in (("verify", "a.cdefsrc"), ("dump", "a.cdefsrc"), ("dump", "--json", "a.cdefsrc"),
+                          ("source", "a.cdefsrc"), ("diff", "a.cdefsrc", sound), ("diff", sound, "a.cdefsrc")):
+                with self.subTest(words):
+                    result = subprocess.run([PROGRAMS.cdef, *words], cwd=directory, capture_output=True, text=True,
+                                            check=False, timeout=60)
+                    self.assertEqual((result.returncode, result.stdout, result.stderr), (2, "", expected))
+
     def test_a_database_given_to_check_belongs_to_verify(self):
         message = "cdef: {}: a database, not a source; 'cdef verify' checks databases\n"
         for name in (SOUND, SOUND.replace("little", "big"), WRONG):

@@ -172,14 +172,19 @@ std::vector<std::string> names_of_orders() {
 
 void add_options(command &to, build_options &options) {
     to.add("SOURCE", options.operands, "Source, or directory of sources (*.cdefsrc); - is standard input").required();
-    option file = to.add("-o,--output", options.file, "The database; - is standard output");
-    to.add("-d,--directory", options.directory, "Put all databases into DIRECTORY").excludes(file);
-    to.add("--byte-order", options.order, "native, little, big or both (NAME.le.cdef and NAME.be.cdef)")
+    option file = to.add("-o,--output", options.file, "The database; - is standard output").called("FILE");
+    to.add("-d,--directory", options.directory, "Put all databases into DIRECTORY").called("DIRECTORY").excludes(file);
+    to.add("--byte-order", options.order,
+           "native, little, big or both: NAME.le.cdef and NAME.be.cdef (default: that of cdef.toml, or native)")
+        .called("ORDER")
         .one_of(names_of_orders());
     to.add("--timestamp", options.timestamp,
-           "Time in the database: none, now or SECONDS since 1970; by default SOURCE_DATE_EPOCH, else none");
-    to.add("--depfile", options.depfile, "Write the dependencies of the databases to FILE, for Make or Ninja");
-    to.add_number("-j,--jobs", options.jobs, build_command::MOST_JOBS, "Compile this many sources at once");
+           "Time in the database: none, now or SECONDS since 1970 (default: SOURCE_DATE_EPOCH, or none)")
+        .called("TIME");
+    to.add("--depfile", options.depfile, "Write the dependencies of the databases to FILE, for Make or Ninja")
+        .called("FILE");
+    to.add_number("-j,--jobs", options.jobs, build_command::MOST_JOBS,
+                  "Compile this many sources at once (default: number of processors)");
     to.add_flag("--sync", options.sync, "Wait until each database is on the disk before it replaces the old one");
     to.add_flag("--list", options.list, "List the databases and build none");
     add_finding_options(to, options.findings);

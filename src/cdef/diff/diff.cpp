@@ -122,7 +122,7 @@ std::optional<compare::level> level_of(const std::string &option) {
 }
 
 std::string check_level(const std::string &option) {
-    return level_of(option) ? "" : option + " is not a level: readers, clients or stored";
+    return level_of(option) ? "" : "'" + option + "' is not readers, clients or stored";
 }
 
 struct outcome {

@@ -336,11 +336,17 @@ void add_gate(program &app) {
     made.add("SOURCE", options->operands,
              "Source or database, or directory of sources (*.cdefsrc); - is standard input")
         .required();
-    made.add("--against", options->against, "The older version: a file, a directory, or git:REVISION[:PATH]");
-    made.add("--level", options->level, "What relies on the older version; each level includes those before it")
+    made.add("--against", options->against, "The older version: a file, a directory, or git:REVISION[:PATH]")
+        .called("VERSION");
+    made.add("--level", options->level,
+             "What relies on the older version; each level includes those before it (default: that of cdef.toml, or "
+             "readers)")
+        .called("LEVEL")
         .one_of({"readers", "clients", "stored"});
     made.add("--ids", options->ids,
-             "File of all numbers that have been in use; the default is ids.lock beside cdef.toml or the source");
+             "File of all numbers that have been in use (default: that of cdef.toml, or ids.lock beside cdef.toml or "
+             "the source)")
+        .called("FILE");
     made.add_flag("--update", options->update, "Record the numbers in that file, even those that contradict it");
     add_report_options(made, options->findings);
     add_project_rules(made, options->findings);

@@ -69,10 +69,11 @@ void add_new(program &app) {
     auto options = std::make_shared<new_options>();
     command made =
         app.add("new", "Writes a commented source for a new class", [options] { return write_first_source(*options); });
-    made.add("KIND", options->kind, "What to write: class").required().one_of({"class"});
+    made.add("KIND", options->kind, "What to write: class").required().one_of_unlisted({"class"});
     made.add("NAME", options->name, "Name of the class").required();
     made.add("-o,--output", options->file,
-             "The source, which must not exist; NAME.cdefsrc if left out; - is standard output");
+             "The source, which must not exist; - is standard output (default: NAME.cdefsrc)")
+        .called("FILE");
 }
 
 } // namespace cdef

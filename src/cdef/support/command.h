@@ -1,5 +1,5 @@
-/* command.h: the options and operands of a subcommand. Only command.cpp and cdef.cpp include the library that reads
- * command lines, because compiling it takes longer than compiling any subcommand. */
+/* command.h: the options and operands of a subcommand. Only command.cpp, usage.cpp and cdef.cpp include the library
+ * that reads command lines, because compiling it takes longer than compiling any subcommand. */
 #ifndef CDGEN_CDEF_COMMAND_H
 #define CDGEN_CDEF_COMMAND_H
 
@@ -15,6 +15,9 @@ class Option;
 } // namespace CLI
 
 namespace cdef {
+
+/* "text, json or hex" for "text,json,hex" */
+std::string listed_words(std::string list);
 
 /* An option or an operand. Each function returns the option itself. */
 class option {
@@ -49,9 +52,9 @@ public:
     option add(const std::string &names, std::string &to, const std::string &help);
     option add(const std::string &names, std::optional<std::string> &to, const std::string &help);
     option add(const std::string &names, std::vector<std::string> &to, const std::string &help);
-    /* From 1 to most. */
+    /* From 1 to most, in decimal digits. Help calls the value N, as in the next function. */
     option add_number(const std::string &names, unsigned &to, unsigned most, const std::string &help);
-    /* From 0. The help shows the default. */
+    /* From 0. The help shows the default, which is the present value. */
     option add_count(const std::string &names, std::size_t &to, const std::string &help);
     option add_flag(const std::string &names, bool &to, const std::string &help);
     /* A flag that may have a value, after "=". */

@@ -7,7 +7,9 @@
 #include "cdef/support/input.h"
 #include "cdef/support/output.h"
 #include "check/switches.h"
+#include "language/suggestions.h"
 
+#include <algorithm>
 #include <cstdio>
 #include <string_view>
 #include <unistd.h>
@@ -18,14 +20,15 @@ namespace {
 
 using check::warning;
 
-std::vector<std::string> warning_names() {
-    std::vector<std::string> names;
-    names.emplace_back("all");
-    for (const warning &known : check::warnings) {
-        names.emplace_back(known.name);
-        names.emplace_back(known.code);
-    }
-    return names;
+std::string check_warning(const std::string &name) {
+    language::name_list names = {"all"};
+    for (const warning &known : check::warnings)
+        names.insert(names.end(), {known.name, known.code});
+    if (std::find(names.begin(), names.end(), name) != names.end())
+        return {};
+    std::string meant = language::suggestion(name, names);
+    return "unknown warning " + language::quoted(name) + "; " + (meant.empty() ? "" : meant + " ") +
+           "'cdef explain' lists all";
 }
 
 void show_text(std::string_view text) {
@@ -65,7 +68,7 @@ void finding_options::fail_source(report::writer &to, const std::string &why) co
 void add_report_options(command &to, finding_options &options) {
     add_forms(to, options.form, {"text", "json", "sarif", "github", "gitlab"},
               "Form of the findings; text is written to standard error");
-    to.add_count("--max", options.text.shown_max, "Show at most N findings as text, errors first; 0: all").called("N");
+    to.add_count("--max", options.text.shown_max, "Show at most N findings as text, errors first; 0: all");
     to.add_flag("-q,--quiet", options.text.quiet, "Show errors only, without a summary, as text");
     add_colour(to, options.colour);
 }
@@ -80,15 +83,14 @@ void add_project_rules(command &to, finding_options &options) {
 
 void add_finding_options(command &to, finding_options &options) {
     add_report_options(to, options);
-    std::vector<std::string> names = warning_names();
     to.add("--warn", options.wanted, "Turn on warning NAME ('cdef explain' lists names and codes), or all")
         .called("NAME")
         .one_value_each()
-        .one_of_unlisted(names);
+        .checked(check_warning);
     to.add("--no-warn", options.unwanted, "Turn off warning NAME, or all")
         .called("NAME")
         .one_value_each()
-        .one_of_unlisted(names);
+        .checked(check_warning);
     add_project_rules(to, options);
 }
 

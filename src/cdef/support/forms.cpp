@@ -8,7 +8,7 @@ namespace cdef {
 
 void add_forms(command &to, std::string &form, const std::vector<std::string> &forms, const std::string &help) {
     form = forms.front();
-    option format = to.add("--format", form, help).one_of(forms);
+    option format = to.add("--format", form, help + " (default: " + form + ")").called("FORM").one_of(forms);
     std::optional<option> former;
     for (const std::string short_form : {"json", "hex"}) {
         if (std::find(forms.begin(), forms.end(), short_form) == forms.end())
@@ -23,7 +23,9 @@ void add_forms(command &to, std::string &form, const std::vector<std::string> &f
 
 void add_colour(command &to, std::string &colour) {
     colour = "auto";
-    to.add("--color", colour, "Whether text has colours; auto: on a terminal").one_of({"auto", "always", "never"});
+    to.add("--color", colour, "Whether text has colours; auto: on a terminal (default: auto)")
+        .called("WHEN")
+        .one_of({"auto", "always", "never"});
 }
 
 } // namespace cdef

@@ -1,5 +1,7 @@
 """Test which changes script/mutate makes."""
 
+import json
+
 import pytest
 
 from scripts import script
@@ -41,3 +43,21 @@ def test_an_id_moves_with_its_line():
     moved, second = MUTATE.mutants_of("x.cpp", "\n\na == b;\na == b;\n")
     assert (moved.id, moved.line) == (one.id, 3)
     assert second.id != one.id
+
+
+@pytest.mark.parametrize("verdicts, at_least, status", [
+    (["killed"] * 19 + ["survived"], "95", 0),
+    (["killed"] * 18 + ["survived"] * 2, "95", 1),
+    (["killed"] * 18 + ["survived"] * 2, None, 0),
+    (["not compiling"], "95", 0),
+    ([], "95", 0),
+])
+def test_status(verdicts, at_least, status, directory, monkeypatch):
+    """Only a share that is asked for and not reached is a failure. Without any judged change there is no share."""
+    every = list(MUTATE.mutants_of("x.cpp", "a == b;\n" * 20))
+    monkeypatch.setattr(MUTATE, "mutants", lambda seed, only: every)
+    monkeypatch.setattr(MUTATE, "RESULTS", directory / "results.jsonl")
+    MUTATE.RESULTS.write_text("".join(json.dumps({"id": each.id, "verdict": verdict}) + "\n"
+                                      for each, verdict in zip(every, verdicts)))
+    monkeypatch.setattr("sys.argv", ["mutate", "--report"] + ([f"--at-least={at_least}"] if at_least else []))
+    assert MUTATE.main() == status

@@ -70,3 +70,14 @@ def test_failure_is_not_recorded(directory, monkeypatch, capsys):
     assert PROOF.run("good", 1, "now")
     assert recorded("now")["good"][1]["said"] == "1 passed"
     assert recorded("now")["bad"] == {}
+
+
+def test_verdict_is_given_with_the_last_portion(directory, monkeypatch, capsys):
+    """Earlier portions are too few to be judged. A step whose verdict is bad is not complete."""
+    monkeypatch.setattr(PROOF, "PLACE", directory)
+    monkeypatch.setattr(PROOF, "DONE", directory / "done.jsonl")
+    monkeypatch.setattr(PROOF, "STEPS", {"step": PROOF.Step("", "", 2, 1, "echo tried", verdict="echo too few; false")})
+    assert PROOF.run("step", 0, "now")
+    assert not PROOF.run("step", 1, "now")
+    assert "failed with status 1: too few" in capsys.readouterr().out
+    assert list(recorded("now")["step"]) == [0]

@@ -76,7 +76,7 @@ report_of_document report_on(session &now, const std::string &uri) {
 
 void publish(session &now, const std::string &uri) {
     if (now.client.pulls) {
-        now.asks_again = now.client.refreshes;
+        now.refresh_due = now.client.refreshes;
         return;
     }
     report_of_document found = report_on(now, uri);

@@ -174,8 +174,8 @@ void server::work() {
 /* When all work is done, tells a client that requests findings to request them again. */
 void server::finish_step() {
     publish_problems(now);
-    if (now.asks_again && !has_work()) {
-        now.asks_again = false;
+    if (now.refresh_due && !has_work()) {
+        now.refresh_due = false;
         now.ask("workspace/diagnostic/refresh", nullptr);
     }
 }

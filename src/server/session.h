@@ -93,8 +93,8 @@ struct session {
     std::map<std::string, document> open; /* by key_of their URIs */
     std::set<std::string> unpublished;    /* keys of open documents that changed since their findings were sent */
     std::vector<std::string> outbox;
-    unsigned asked = 0;      /* number of requests that the server has sent */
-    bool asks_again = false; /* true: the client has to be told to request findings again */
+    unsigned asked = 0;       /* number of requests that the server has sent */
+    bool refresh_due = false; /* true: the client has to be told to request findings again */
 };
 
 } // namespace lsp

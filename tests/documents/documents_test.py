@@ -119,7 +119,7 @@ class Release(unittest.TestCase):
         (value,) = re.findall(expression, (PROJECT / name).read_text(), re.M)
         return value
 
-    def test_version_is_the_same_wherever_it_stands(self):
+    def test_version_is_the_same_everywhere(self):
         version = self.found("CMakeLists.txt", r"^project\(cdgen VERSION (\S+)")
         self.assertEqual(self.found("editors/vscode/package.json", r'^  "version": "(.*)"'), version)
         self.assertRegex((PROJECT / "CHANGELOG.md").read_text(), rf"(?m)^## {re.escape(version)},")
@@ -128,7 +128,7 @@ class Release(unittest.TestCase):
         for path in (*DOCUMENTS, *(PROJECT / "examples").rglob("CMakeLists.txt")):
             self.assertNotRegex(path.read_text(), r"find_package\(cdgen \d", path)
 
-    def test_date_is_the_same_wherever_it_stands(self):
+    def test_date_is_the_same_everywhere(self):
         seconds = int(self.found("cmake/package.cmake", r"^set\(CPACK_CDGEN_RELEASED (\d+)\)"))
         day = datetime.datetime.fromtimestamp(seconds, datetime.timezone.utc)
         self.assertEqual(self.found("man/from_markdown.py", r'^DATE = "(.*?)"'), f"{day:%Y-%m-%d}")

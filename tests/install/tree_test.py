@@ -16,7 +16,7 @@ class Tree(Case):
         run(program("cdgen"), examples() / "FileSystem.cdefsrc", self.here / "a.cdef")
         self.assertEqual(run(program("cdef"), "verify", self.here / "a.cdef"), "")
 
-    def test_has_the_four_headers_and_no_other(self):
+    def test_has_these_headers_and_no_others(self):
         headers = sorted(path.name for path in (tree() / "include").rglob("*.h"))
         self.assertEqual(headers, ["cdb.h", "cdb_fields.h", "cdb_sections.h", "cdb_values.h", "cdb_view.h", "vx.h"])
 

@@ -293,8 +293,8 @@ void walker::show_variables(const cdb::variable_class &vc) {
 void walker::show_hash_blocks(const cdb::bytes &section) {
     record_at block = {cdb::format_for<rc_hash_block_t>, section, offsetof(rsrc_class_hash_t, rc_hash_blocks),
                        NO_TABLES};
-    auto told = section.number<std::uint32_t>(offsetof(rsrc_class_hash_t, rch_num_hash_blocks));
-    std::size_t count = cdb::count_inside(section, block.at, told, block.format.size);
+    auto recorded = section.number<std::uint32_t>(offsetof(rsrc_class_hash_t, rch_num_hash_blocks));
+    std::size_t count = cdb::count_inside(section, block.at, recorded, block.format.size);
     out.open_list({entries_of(cdb::format_for<rsrc_class_hash_t>), {}});
     for (std::size_t i = 0; i < count; ++i, block.at += block.format.size)
         show_record(block, {}, "block");

@@ -144,11 +144,11 @@ def test_listing(name):
 def test_facts(name):
     """The JSON has the listing's facts, in the listing's order."""
     for order in orders_of(name):
-        told = cdef_dump_listing.Listing()
+        listing = cdef_dump_listing.Listing()
         data = parsed(dump(database(name, order), "--json"))
         expect((data.pop("schema"), data.pop("version")), ("cdef-dump.schema.json", 1), "schema")
-        told.members(0, data)
-        expect("\n".join(told.lines) + "\n", expected_text("listing", name, order), f"JSON, {order}-endian")
+        listing.members(0, data)
+        expect("\n".join(listing.lines) + "\n", expected_text("listing", name, order), f"JSON, {order}-endian")
 
 
 @pytest.mark.parametrize("name", JSONS)
@@ -267,8 +267,8 @@ def test_locator_of_no_attribute():
     """The class has no attribute with the number 7."""
     data = patched(database("minimal"), 342, b"\x07\x00")
     expect(re.findall("rc_locator.*", dump(data)), ["rc_locator: 7, unknown"], "listing")
-    told = parsed(dump(data, "--json"))["sections"][0]["class"]["rc_locator"]
-    expect(told, {"number": 7, "kind": None, "name": None}, "JSON")
+    locator = parsed(dump(data, "--json"))["sections"][0]["class"]["rc_locator"]
+    expect(locator, {"number": 7, "kind": None, "name": None}, "JSON")
 
 
 def test_time_is_utc():
@@ -412,7 +412,7 @@ def test_texts_are_escaped():
     text = dump(data)
     expect(re.findall(r"ra_dflt_value: (.*)", text), [shown for _, shown, _ in TEXTS], "listing")
     parts = parsed(dump(data, "--json"))["sections"][0]["class"]["persistent_resource_attributes"]
-    expect([part["ra_dflt_value"] for part in parts], [told for _, _, told in TEXTS], "JSON")
+    expect([part["ra_dflt_value"] for part in parts], [shown for _, _, shown in TEXTS], "JSON")
     for form in (text, dump(data, "--json"), dump(data, "--hex")):
         hidden = [c for c in form if c != "\n" and unicodedata.category(c) in ("Cc", "Cf", "Zl", "Zp")]
         expect(hidden, [], "characters that a terminal would act upon")

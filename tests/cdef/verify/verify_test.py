@@ -231,7 +231,7 @@ class Input(unittest.TestCase):
             ours.shutdown(socket.SHUT_WR)
             self.assertEqual(verify("-", stdin=theirs), (1, WRONG_LINE.format("-"), ""))
 
-    def test_standard_input_from_where_it_stands(self):
+    def test_standard_input_from_its_present_offset(self):
         with tempfile.TemporaryFile() as file:
             file.write(b"front" + (PROGRAMS.images / WRONG).read_bytes())
             file.flush()

@@ -135,20 +135,20 @@ void put_edge(cell_and_strings &given, const edge_row &row) {
 
 TEST(SwapValue, ReferenceThatIsNotAllInsideIsNotFollowedButReversed) {
     const edge_row rows[] = {
-        {"binary behind the end", VX_BINARY_PTR, 16, 16, 3},
+        {"binary after the end", VX_BINARY_PTR, 16, 16, 3},
         {"binary whose length is cut off", VX_BINARY_PTR, 19, 16, 3},
         {"binary far outside", VX_BINARY_PTR, 48, 0x7FFFFFF8, 0},
         {"binary at the last offset", VX_BINARY_PTR, 48, 0xFFFFFFFC, 0},
         {"binary at 9", VX_BINARY_PTR, 48, 9, 3},
         {"binary at 10", VX_BINARY_PTR, 48, 10, 3},
         {"binary at 11", VX_BINARY_PTR, 48, 11, 3},
-        {"array behind the end", VX_INT32_ARRAY, 8, 8, 1},
+        {"array after the end", VX_INT32_ARRAY, 8, 8, 1},
         {"array whose head is cut off", VX_INT32_ARRAY, 15, 8, 0},
         {"array whose elements are cut off", VX_INT32_ARRAY, 31, 8, 2},
         {"array of more elements than 32 bits of bytes", VX_INT64_ARRAY, 48, 8, 0x20000001},
         {"array of the largest count", VX_INT64_ARRAY, 48, 8, 0xFFFFFFFF},
         {"array at 10", VX_CHAR_PTR_ARRAY, 48, 10, 1},
-        {"structured data behind the end", VX_SD_PTR, 8, 8, 1},
+        {"structured data after the end", VX_SD_PTR, 8, 8, 1},
         {"structured data whose head is cut off", VX_SD_PTR, 15, 8, 0},
         {"structured data whose elements are cut off", VX_SD_PTR, 31, 8, 1},
         {"structured data of the largest count", VX_SD_PTR, 48, 8, 0xFFFFFFFF},
@@ -431,7 +431,7 @@ TEST(SwapSdDef, ValidValuesThatAreNotAllInsideAreNotFollowedButTheReferenceIsRev
         vx_uint32_t offset;
         vx_uint32_t count;
     } rows[] = {
-        {"behind the end", 32, 32, 1},   {"head cut off", 39, 32, 0},        {"entry cut off", 63, 32, 1},
+        {"after the end", 32, 32, 1},    {"head cut off", 39, 32, 0},        {"entry cut off", 63, 32, 1},
         {"largest count", 64, 32, NONE}, {"far outside", 64, 0x40000000, 0}, {"at 6", 64, 6, 1},
     };
     for (const auto &row : rows) {

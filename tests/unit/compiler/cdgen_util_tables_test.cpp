@@ -414,7 +414,7 @@ const lookup lookups[] = {
     {"all that is used", 0, 24, true},
     {"the last byte", 23, 1, true},
     {"nothing, at the end", 24, 0, true},
-    {"nothing, behind the end", 25, 0, false},
+    {"nothing, after the end", 25, 0, false},
     {"the first byte that is free", 24, 1, false},
     {"across the end", 20, 5, false},
     {"more than is used", 0, 25, false},

@@ -10,7 +10,9 @@ namespace report {
 
 namespace {
 
-constexpr size_t COUNTS = 1 << 18; /* a power of two */
+/* Powers of two. Most sources have few findings, which use few pages. */
+constexpr size_t COUNTS = 1 << 18;
+constexpr size_t PAGE = 1 << 10; /* counts */
 
 std::string_view trimmed(std::string_view line) {
     constexpr std::string_view BLANKS = " \t\r";
@@ -50,11 +52,13 @@ std::string fingerprint::text() const {
 }
 
 fingerprint fingerprints::of(const std::string &file, const check::finding &found) {
-    counts.resize(COUNTS);
     constexpr std::string_view END("\0", 1);
     std::uint64_t hash = hash_of(subject_of(found), hash_of(END, hash_of(found.code)));
-    std::uint32_t &count = counts[hash_of(file, hash) % COUNTS];
-    return {hash, ++count};
+    size_t at = hash_of(file, hash) % COUNTS;
+    pages.resize(COUNTS / PAGE);
+    std::vector<std::uint32_t> &page = pages[at / PAGE];
+    page.resize(PAGE);
+    return {hash, ++page[at % PAGE]};
 }
 
 } // namespace report

@@ -25,7 +25,8 @@ public:
     fingerprint of(const std::string &file, const check::finding &found);
 
 private:
-    std::vector<std::uint32_t> counts; /* indexed by the low bits of the hash of a finding and its file */
+    /* Counts, in the order of the low bits of the hash of a finding and its file. A page without counts is empty. */
+    std::vector<std::vector<std::uint32_t>> pages;
 };
 
 /* Sixteen digits. */

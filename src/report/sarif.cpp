@@ -100,17 +100,18 @@ json result_of(const std::string &file, const finding &found, const fingerprint 
     return entry;
 }
 
-json json_of(const rule &known) {
-    json data;
-    data["id"] = known.code;
+/* Appended as text, because every log has more than a hundred rules, and most logs have few findings. */
+void append_rule(std::string &to, const rule &known) {
+    std::string help;
+    append_json(help, known.help);
+    append_json(to += R"({"id":)", known.code);
     if (!known.name.empty())
-        data["name"] = known.name;
-    data["shortDescription"]["text"] = known.title;
-    data["fullDescription"]["text"] = known.cause;
-    data["help"]["text"] = known.help;
-    data["help"]["markdown"] = known.help;
-    data["defaultConfiguration"]["level"] = known.error ? "error" : "warning";
-    return data;
+        append_json(to += R"(,"name":)", known.name);
+    append_json(to += R"(,"shortDescription":{"text":)", known.title);
+    append_json(to += R"(},"fullDescription":{"text":)", known.cause);
+    to.append(R"(},"help":{"text":)").append(help).append(R"(,"markdown":)").append(help);
+    append_json(to += R"(},"defaultConfiguration":{"level":)", known.error ? "error" : "warning");
+    to += "}}";
 }
 
 class sarif_writer : public writer {
@@ -182,8 +183,12 @@ void sarif_log::add_driver(std::string_view tool, std::span<const rule> rules) {
     to.add_text("version", CDGEN_VERSION);
     to.add_text("informationUri", "man:cdef(1)");
     to.open_list("rules");
-    for (const rule &known : rules)
-        to.add_json({}, json_line(json_of(known)));
+    std::string line;
+    for (const rule &known : rules) {
+        line.clear();
+        append_rule(line, known);
+        to.add_json({}, line);
+    }
     to.close();
     to.close();
 }

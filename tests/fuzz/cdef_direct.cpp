@@ -51,6 +51,15 @@ struct judged {
         return {db, strays};
     }
 
+    /* As cdef::require_readable() has it, without verifying again; of a readable database. */
+    cdef::readability readability() const {
+        cdef::readability known = {owners(), {}};
+        for (const cdb::finding &f : findings)
+            if (f.broken->level == cdb::severity::error && !known.first_of(f.broken->code))
+                known.errors.push_back(f);
+        return known;
+    }
+
     cdb::database db;
     std::vector<cdb::finding> findings;
 };
@@ -62,15 +71,15 @@ void show_findings(const judged &it) {
         expect_harmless(cdef::verify::line_of("file", f));
 }
 
-void show_database(const bytes &image, const words &form) {
+void show_database(const bytes &image, const judged &it, const words &form) {
     cdef::input in("file", image);
     captured out(stdout);
     if (has(form, "--hex"))
         cdef::dump::show_hex(in);
     else if (has(form, "--json"))
-        cdef::dump::show_json(in, cdef::require_readable(in), has(form, "--offsets"));
+        cdef::dump::show_json(in, it.readability(), has(form, "--offsets"));
     else
-        cdef::dump::show_listing(in, cdef::require_readable(in), has(form, "--offsets"), false);
+        cdef::dump::show_listing(in, it.readability(), has(form, "--offsets"), false);
     std::string shown = out.taken();
     require(!shown.empty() || image.empty(), "nothing is shown");
     expect_harmless(shown);
@@ -93,7 +102,7 @@ void read_directly(const bytes &image, const words &form) {
     judged it(image);
     show_findings(it);
     if (form.front() == "dump" && (it.readable() || has(form, "--hex")))
-        show_database(image, form);
+        show_database(image, it, form);
     if (form.front() == "source" && it.readable())
         write_source(it);
 }

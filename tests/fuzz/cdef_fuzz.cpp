@@ -434,6 +434,9 @@ const std::array<form, 2> other_forms = {{
 const form correcting = {{"check", "--fix", "--dry-run"}, look_at_check};
 constexpr unsigned CORRECTING = 0x1C; /* the first form of check, with bit 4 */
 
+/* An input that is also passed to the program through its command line takes ten times as long. */
+constexpr std::uint32_t COMMAND_LINE_ONE_IN = 256;
+
 constexpr unsigned WHOLE = 0x10;
 constexpr unsigned SAME = 0x20;
 
@@ -482,14 +485,26 @@ void try_comparison(const form &with, const pair_of_files &both, bool by_command
         look_at_diff(shown(with.arguments, {f.first.path, f.second.path}), both.before, both.after, with.arguments);
 }
 
-/* The most bytes of a source that are checked each time, because many unknown names take long. */
-bytes beginning_of(const bytes &source) {
+/* True for one in so many inputs. Only the input decides this. A replay has time for all of them. */
+bool is_one_in([[maybe_unused]] std::uint32_t number, [[maybe_unused]] std::span<const std::byte> input) {
 #ifdef CDGEN_FUZZ
-    constexpr std::size_t MOST = 512;
-    return {source.begin(), source.begin() + static_cast<std::ptrdiff_t>(std::min(source.size(), MOST))};
+    std::uint32_t hash = 2166136261;
+    for (std::byte byte : input)
+        hash = (hash ^ std::to_integer<std::uint32_t>(byte)) * 16777619;
+    return (hash >> 12) % number == 0;
 #else
-    return source;
+    return true;
 #endif
+}
+
+/* The part of a source that is checked. The whole takes long if it has many unknown names, because near ones are looked
+ * for, so most inputs give their beginning only. */
+bytes beginning_of(const bytes &source) {
+    constexpr std::uint32_t WHOLE_ONE_IN = 8;
+    constexpr std::size_t MOST = 128;
+    if (is_one_in(WHOLE_ONE_IN, source))
+        return source;
+    return {source.begin(), source.begin() + static_cast<std::ptrdiff_t>(std::min(source.size(), MOST))};
 }
 
 void try_build(const form &with, const bytes &file, bool by_command_line) {
@@ -523,20 +538,6 @@ void try_file(const form &with, const bytes &file, bool by_command_line) {
     with.look(shown(with.arguments, {f.first.path}), file, with.arguments);
 }
 
-/* True if an input is also passed to the program through its command line, which takes ten times as long. Only the
- * input decides this. A replay has time for all of them. */
-bool takes_command_line(std::span<const std::uint8_t> data) {
-#ifdef CDGEN_FUZZ
-    constexpr std::uint32_t ONE_IN = 64;
-#else
-    constexpr std::uint32_t ONE_IN = 1;
-#endif
-    std::uint32_t hash = 2166136261;
-    for (std::uint8_t byte : data)
-        hash = (hash ^ byte) * 16777619;
-    return (hash >> 16) % ONE_IN == 0;
-}
-
 const form &form_for(std::uint8_t choice) {
     unsigned low = choice & 0xFU;
     if (low >= FIRST_CHECK && (choice & BUILD) != 0)
@@ -558,7 +559,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size
         return 0;
     const form &with = form_for(data[0]);
     std::span<const std::byte> rest = std::as_bytes(std::span(data, size)).subspan(1);
-    bool by_command_line = takes_command_line({data, size});
+    bool by_command_line = is_one_in(COMMAND_LINE_ONE_IN, std::as_bytes(std::span(data, size)));
     if (with.look == nullptr && rest.size() >= 2)
         try_comparison(with, pair_in(rest, data[0]), by_command_line);
     else if (with.look == look_at_build)
@@ -573,8 +574,9 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size
 }
 
 #ifdef CDGEN_FUZZ
-/* Of where memory was taken, the innermost callers say enough; to note all of them takes long. */
+/* The innermost caller is enough to know where memory was taken; to note all of them takes long. A replay, without this
+ * option, shows them. */
 extern "C" const char *__asan_default_options() {
-    return "malloc_context_size=2";
+    return "malloc_context_size=1";
 }
 #endif

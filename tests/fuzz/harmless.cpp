@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <array>
+#include <cstddef>
 #include <string_view>
 
 namespace fuzz {
@@ -54,9 +55,23 @@ bool is_ascii(const std::string &text) {
     return std::all_of(text.begin(), text.end(), [](char c) { return static_cast<unsigned char>(c) < 0x80; });
 }
 
+/* True if all bytes are printable ASCII, newlines and tabs, as nearly always. Nothing here needs a sanitizer, and with
+ * one, this would take longer than some of the functions that made the text. */
+__attribute__((no_sanitize("address", "undefined"))) bool is_plain(const char *text, std::size_t size) {
+    unsigned strange = 0;
+    for (const char *end = text + size; text != end; ++text) {
+        auto c = static_cast<unsigned char>(*text);
+        unsigned is_printable = static_cast<unsigned char>(c - 0x20) < 0x7F - 0x20;
+        strange |= 1U ^ (is_printable | static_cast<unsigned>(c == '\n') | static_cast<unsigned>(c == '\t'));
+    }
+    return strange == 0;
+}
+
 } // namespace
 
 void expect_harmless(const std::string &text) {
+    if (is_plain(text.data(), text.size()))
+        return;
     for (std::size_t i = 0; i < text.size(); ++i) {
         auto c = static_cast<unsigned char>(text[i]);
         bool control = (c < 0x20 && c != '\n' && c != '\t') || c == 0x7F || is_long_control(text, i);

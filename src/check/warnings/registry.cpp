@@ -79,8 +79,8 @@ constexpr row rows[] = {
      make_overlap},
     {{SAME_ID, "S507", "same-id", "two attributes or actions have the same Id",
       "Two attributes or actions of one kind have the same `Id`. The same is reported of a persistent and a dynamic "
-      "attribute, if both are attributes of a resource or both of the class. Text that is not a number (S510) does not "
-      "count.",
+      "attribute, if both are attributes of a resource or both of the class. An `Id` that is not a number (S510) is "
+      "not compared.",
       "Give one of them another number."},
      make_same_id},
     {{SAME_NAME, "S506", "same-name", "two names are equal or differ only in case",
@@ -91,8 +91,9 @@ constexpr row rows[] = {
      make_same_name},
     {{RANGE_ELSEWHERE, "S503", "range-elsewhere", "a Range does not take effect in its own attribute",
       "A `Range` of a `DynamicClassAttribute` is stored in a `DynamicResourceAttribute` that is still "
-      "open. Or another dynamic attribute is completed between the `Range` and the end of its own attribute. Then the "
-      "`Range` may be lost, and the other attribute, if it has no `Range`, gets the range 0 to 0 instead of 0 to 100.",
+      "open. Or another dynamic attribute is completed after the `Range` line, but before the attribute to which the "
+      "line belongs. Then the `Range` may be lost, and the other attribute, if it has none, gets the range 0 to 0 "
+      "instead of 0 to 100.",
       "Put dynamic class attributes before dynamic resource attributes, and give the last dynamic class attribute no "
       "`Range`. "
       "After an attribute with a `Range`, put another of its kind."},
@@ -129,8 +130,8 @@ constexpr row rows[] = {
       "Combine the two stanzas."},
      make_second_resource_class},
     {{OVERRIDDEN, "S525", "overridden", "a line replaces an earlier one",
-      "A type that is not an array has a second `DefaultValue`, or a valid value a second `ValueDisplayName`. "
-      "Only the last one counts.",
+      "An attribute whose type is not an array has a second `DefaultValue`, or a valid value a second "
+      "`ValueDisplayName`. Only the last one counts.",
       "Remove one of the lines. For a list of values, choose an array type."},
      make_overridden},
     {{COMMA_LIST, "S526", "comma-list", "commas do not separate values",
@@ -168,7 +169,7 @@ constexpr row rows[] = {
      make_properties},
     {{INVALID_DEFAULT, "S533", "invalid-default", "a default is not a valid value",
       "A `DefaultValue` or `InitialValue` is not among the valid values of its attribute, or is outside its `Range`. "
-      "Without such a line, the default of the type is checked: 0 or an empty text, or one such element of an array. "
+      "Without such a line, the default of the type is checked: 0, an empty text, or an array of one of these. "
       "An attribute with `ReqdForDefine` is not checked, because it needs no default. Elements of structured "
       "data have no defaults of their own.",
       "Choose a default that is allowed, or allow it."},

@@ -58,10 +58,6 @@ attr_text current_line::replaced(std::string_view by, size_t added) {
     return {copy.data(), copy.data() + blanks, copy.data() + length};
 }
 
-place current_line::all() const {
-    return {number, column_of(text.name), whole().size()};
-}
-
 place current_line::marked(mark_kind kind, const attr_place &attr, const char *item) const {
     if (kind == mark_kind::none || text.end == nullptr)
         return none();

@@ -53,7 +53,9 @@ public:
         return {number, 0, 0};
     }
     /* All of the text. */
-    place all() const;
+    place all() const {
+        return {number, column_of(text.name), whole().size()};
+    }
     /* A part of the text. */
     place part(std::string_view in_text) const {
         return {number, column_of(in_text.data()), in_text.size()};

@@ -52,7 +52,8 @@ void recovery::take_header(const attr_text &text, bool guessed) {
     bool no_index = loses_index(kind);
     errors_before_header = found.errors();
     header_reported = false;
-    known.split = {};
+    if (known.split.kind != NO_KIND) /* rarely; to clear it for every header would take long */
+        known.split = {};
     for (int tries = 0; tries < HEADER_TRIES; ++tries) {
         try {
             compiler.take_line(text);

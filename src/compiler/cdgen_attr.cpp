@@ -70,10 +70,11 @@ void observe(const cdgen &cx, const table_attrs &attr, bare_value value) {
 /* Reports a line of a stanza that is watched. */
 [[gnu::noinline]] void watch(const cdgen &cx, const table_attrs &attr, bare_value value) {
     observe(cx, attr, value);
+    if (cx.options.debugLevel < 2)
+        return;
     *value.end = '\0';
-    if (cx.options.debugLevel >= 2)
-        printf("%s: found attr: \"%s\", value: \"%s\",length: %d\n", cx.framing.scp->sc_name, attr.ta_name, value.text,
-               static_cast<int>(value.end - value.text));
+    printf("%s: found attr: \"%s\", value: \"%s\",length: %d\n", cx.framing.scp->sc_name, attr.ta_name, value.text,
+           static_cast<int>(value.end - value.text));
 }
 
 bool missing_excused(const cdgen &cx, const srtable_ctrl &scp) {
@@ -103,7 +104,8 @@ void count_required(cdgen &cx, const table_attrs &attr) {
 
 } // namespace
 
-void save_attr_line(cdgen &cx, attr_text text) {
+void save_attr_line(cdgen &cx, char *line, char *name, char *end) {
+    attr_text text = {line, name, end};
     const table_attrs *attr = cx.framing.state->order.expected(*cx.framing.scp, text.name);
     if (attr == nullptr)
         cx.source.point_at(text.line, text.name);

@@ -12,8 +12,9 @@ struct attr_line {
     size_t length;
 };
 
-/* Takes one attribute line of the current stanza. */
-void save_attr_line(cdgen &cx, attr_text text);
+/* Takes one attribute line of the current stanza. These are the parts of an attr_text, which would not be passed in
+ * registers as a whole; to read it from memory where it has just been written takes long. */
+void save_attr_line(cdgen &cx, char *line, char *name, char *end);
 
 /* Converts the value of a line and stores it, by the attribute's type. */
 void store_value(const attr_line &line);

@@ -78,10 +78,11 @@ void begin_plain_stanza(cdgen &cx) {
 }
 
 void begin_stanza(cdgen &cx, attr_text text) {
-    *text.end = '\0';
     cx.framing.table_id = set_table_id({text.name, static_cast<size_t>(text.end - text.name)});
-    if (cx.framing.table_id < 0)
+    if (cx.framing.table_id < 0) {
+        *text.end = '\0';
         source_error(cx, MSG_UNKNOWN_STANZA, text.name);
+    }
     cx.framing.prev_scp = cx.framing.scp;
     make_current(cx, sc_tables[static_cast<size_t>(cx.framing.table_id)]);
     cx.framing.curr_sd_scp = cx.framing.scp;
@@ -99,7 +100,7 @@ void take_line(cdgen &cx, attr_text text) {
     else if (cx.framing.state == nullptr)
         source_error(cx, MSG_NO_STANZA);
     else
-        save_attr_line(cx, text);
+        save_attr_line(cx, text.line, text.name, text.end);
 }
 
 namespace {

@@ -91,7 +91,7 @@ void save_attr(cdgen &cx, char *il, int table_id) {
     char *name = il + strspn(il, " \t");
     other_stanza while_taken(cx.framing);
     make_current(cx, sc_tables[static_cast<size_t>(table_id)]);
-    save_attr_line(cx, {il, name, name + strlen(name)});
+    save_attr_line(cx, il, name, name + strlen(name));
 }
 
 void set_props(vx_uint32_t *dest, const props_t *props, int len, char *vnoq) {

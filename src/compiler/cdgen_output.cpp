@@ -30,24 +30,23 @@ constexpr int MOST_TRIES = 16; /* attempts to open a file that other programs re
     cannot(what, strerror(error));
 }
 
-/* A descriptor that is closed unless it is passed on. Closing it releases the lock, so after that no signal may remove
- * the file. */
+/* A descriptor of the output that is closed unless it is passed on. */
 struct output_fd {
-    explicit output_fd(int opened) : fd(opened) {}
+    output_fd(output_file &owner, int opened) : file(&owner), fd(opened) {}
     output_fd(const output_fd &) = delete;
     output_fd &operator=(const output_fd &) = delete;
     ~output_fd() {
-        if (fd < 0)
-            return;
-        set_unfinished_output(nullptr);
-        close(fd);
+        if (file != nullptr)
+            file->close_output(fd);
     }
-    output_fd(output_fd &&other) noexcept : fd(other.release()) {}
+    output_fd(output_fd &&other) noexcept : file(std::exchange(other.file, nullptr)), fd(other.fd) {}
     output_fd &operator=(output_fd &&) = delete;
     int release() {
-        return std::exchange(fd, -1);
+        file = nullptr;
+        return fd;
     }
 
+    output_file *file;
     int fd;
 };
 
@@ -78,48 +77,54 @@ void lock_output(int fd) {
         cannot(MSG_CANNOT_CREATE, errno);
 }
 
-/* Opens the output without changing it; st receives its status. A regular file is locked. If another compiler failed
- * and removed the file before it was locked, it is closed again. Signals are held back so that none leaves an empty
- * file that opening may have created. */
+/* Locks the file. Returns false if it has lost its name before, because another compiler failed and removed it. st
+ * receives its status while it is locked. */
+bool take_output(output_file &file, const char *name, int fd, struct stat &st) {
+    lock_output(fd);
+    file.begun = {name, st.st_dev, st.st_ino};
+    return stat(name, &st) == 0 && st.st_dev == file.begun.device && st.st_ino == file.begun.inode;
+}
+
+/* Opens the output without changing it; st receives its status. A regular file is locked. Returns no file if it is to
+ * be opened again. Signals are held back from before it is created. */
 output_fd open_once(cdgen &cx, struct stat &st) {
     refuse_own_files(cx);
-    held_signals until_begun;
-    output_fd out(above_stdio(open(cx.options.cdefname, O_RDWR | O_CREAT | O_CLOEXEC, 0644)));
+    cx.output.held.emplace();
+    output_fd out(cx.output, above_stdio(open(cx.options.cdefname, O_RDWR | O_CREAT | O_CLOEXEC, 0644)));
     if (out.fd < 0)
         cannot(MSG_CANNOT_CREATE, errno);
     if (fstat(out.fd, &st) != 0)
         cannot(MSG_CANNOT_MAP, errno);
     if (!S_ISREG(st.st_mode))
-        return out;
-    lock_output(out.fd);
-    if (fstat(out.fd, &st) != 0) /* its size while it is locked */
-        cannot(MSG_CANNOT_MAP, errno);
-    cx.output.begun = {cx.options.cdefname, st.st_dev, st.st_ino};
-    if (!cx.output.begun.has_its_name())
-        return output_fd(-1);
-    if (st.st_size == 0)
-        set_unfinished_output(&cx.output.begun);
+        cx.output.held.reset(); /* it may block, and is not removed */
+    else if (!take_output(cx.output, cx.options.cdefname, out.fd, st))
+        return {cx.output, -1};
     return out;
 }
 
+/* Empties a file that contains something, unless a signal is about to end the program. */
+bool emptied(const output_file &file, int fd, const struct stat &st) {
+    if (st.st_size > 0 && file.held->will_end_program())
+        return false;
+    set_unfinished_output(&file.begun);
+    if (st.st_size > 0 && ftruncate(fd, 0) != 0)
+        cannot(MSG_CANNOT_CREATE, errno);
+    return true;
+}
+
 /* Emptied only once it is locked and known not to be a file that the program uses. */
-output_fd create_output(cdgen &cx) {
+output_fd create_output(cdgen &cx, struct stat &st) {
     for (int tries = 0; tries < MOST_TRIES; ++tries) {
-        struct stat st = {};
         output_fd out = open_once(cx, st);
-        if (out.fd < 0)
-            continue;
-        if (S_ISREG(st.st_mode))
-            set_unfinished_output(&cx.output.begun);
-        if (S_ISREG(st.st_mode) && st.st_size > 0 && ftruncate(out.fd, 0) != 0)
-            cannot(MSG_CANNOT_CREATE, errno);
-        return out;
+        if (out.fd >= 0 && (!S_ISREG(st.st_mode) || emptied(cx.output, out.fd, st)))
+            return out;
     }
     cannot(MSG_CANNOT_CREATE, "other programs keep replacing it");
 }
 
-/* Writes 1024-byte zero blocks until there are at least size bytes, many of them at a time. */
-size_t prefill(int fd, size_t size) {
+/* Writes 1024-byte zero blocks until there are at least size bytes, many of them at a time. Gives up if a signal is
+ * about to end the program; nothing is printed then. */
+size_t prefill(const output_file &file, int fd, size_t size) {
     constexpr size_t BLOCKS_AT_ONCE = 512;
     static const std::array<char, PREFILL_BLOCK> zeros = {};
     std::array<iovec, BLOCKS_AT_ONCE> blocks;
@@ -136,17 +141,41 @@ size_t prefill(int fd, size_t size) {
         if (n <= 0)
             cannot(MSG_CANNOT_CREATE, n < 0 ? errno : ENOSPC);
         written += static_cast<size_t>(n);
+        if (written < gross && file.held && file.held->will_end_program())
+            cannot(MSG_CANNOT_CREATE, EINTR);
     }
     return gross;
 }
 
+/* What another program changes when it shortens the image, even if the file is extended with zeros afterwards: the last
+ * byte that is not zero. And what changes if it then writes something else: the beginning. */
+class cut_mark {
+public:
+    cut_mark(const char *mapped, size_t size) : image(mapped) {
+        memcpy(beginning.data(), image, std::min(beginning.size(), size));
+        for (last = size; last > 0 && image[last - 1] == 0;)
+            --last;
+        last_byte = last > 0 ? image[last - 1] : '\0';
+    }
+    bool is_there() const {
+        return memcmp(image, beginning.data(), std::min(beginning.size(), last)) == 0 &&
+               (last == 0 || image[last - 1] == last_byte);
+    }
+
+private:
+    const char *image;
+    std::array<char, sizeof(orb_cdb_header_t)> beginning = {};
+    size_t last = 0; /* the number of bytes up to the last one that is not zero */
+    char last_byte = 0;
+};
+
 } // namespace
 
 char *get_mapfile(cdgen &cx, size_t size) {
-    output_fd out(create_output(cx));
     struct stat st = {};
-    if (fstat(out.fd, &st) == 0 && !S_ISFIFO(st.st_mode))
-        cx.output.gross_file_size = prefill(out.fd, size);
+    output_fd out(create_output(cx, st));
+    if (!S_ISFIFO(st.st_mode))
+        cx.output.gross_file_size = prefill(cx.output, out.fd, size);
     if (fstat(out.fd, &st) != 0)
         cannot(MSG_CANNOT_MAP, errno);
     if (S_ISREG(st.st_mode) && std::cmp_less(st.st_size, cx.output.gross_file_size))
@@ -157,16 +186,25 @@ char *get_mapfile(cdgen &cx, size_t size) {
         cannot(MSG_CANNOT_MAP, errno);
     cx.output.cdb_mapfile_fd = out.release();
     cx.output.cdb_mapfile_ptr = mapped;
+    cx.output.begun.fd = cx.output.cdb_mapfile_fd;
+    cx.output.begun.size = static_cast<off_t>(length);
     return static_cast<char *>(mapped);
 }
 
 void output_file::finish(off_t size) {
+    auto final_size = static_cast<size_t>(size);
+    cut_mark mark(static_cast<char *>(cdb_mapfile_ptr), final_size);
+    bool whole = has_at_least(gross_file_size);
+    if (whole) {
+        begun.size = size;
+        [[maybe_unused]] int truncated = ftruncate(cdb_mapfile_fd, size);
+        whole = mark.is_there() && has_at_least(final_size);
+    }
     unmap();
-    struct stat st = {};
-    bool cut = fstat(cdb_mapfile_fd, &st) == 0 && std::cmp_less(st.st_size, gross_file_size);
-    [[maybe_unused]] int truncated = cut ? 0 : ftruncate(cdb_mapfile_fd, size);
-    close_mapfile();
-    if (cut)
+    if (!whole)
+        set_unfinished_output(nullptr); /* the file now belongs to another program */
+    close_output(std::exchange(cdb_mapfile_fd, 0));
+    if (!whole)
         cannot(MSG_CANNOT_MAP, CUT_OUTPUT);
 }
 
@@ -175,12 +213,22 @@ void output_file::discard() {
         return;
     unmap();
     begun.remove(); /* while it is locked, because afterwards it may belong to another compiler */
-    close_mapfile();
+    close_output(std::exchange(cdb_mapfile_fd, 0));
 }
 
-void output_file::close_mapfile() {
+void output_file::close_output(int fd) {
+    if (held && held->will_end_program())
+        remove_unfinished_output(); /* while it is locked */
     set_unfinished_output(nullptr);
-    close(std::exchange(cdb_mapfile_fd, 0));
+    if (fd >= 0)
+        close(fd);
+    held.reset();
+}
+
+/* True if the size is not known, too. */
+bool output_file::has_at_least(size_t size) const {
+    struct stat st = {};
+    return fstat(cdb_mapfile_fd, &st) != 0 || !std::cmp_less(st.st_size, size);
 }
 
 void output_file::unmap() {

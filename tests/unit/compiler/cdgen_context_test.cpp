@@ -8,6 +8,7 @@
 #include <cerrno>
 #include <csignal>
 #include <cstdio>
+#include <cstdlib>
 #include <exception>
 #include <filesystem>
 #include <fstream>
@@ -92,20 +93,73 @@ TEST_F(Context, EndWithoutMemoryRemovesAnUnfinishedOutput) {
     EXPECT_FALSE(std::filesystem::exists(output));
 }
 
+/* If the program itself calls abort. */
+TEST_F(Context, AbortRemovesAnUnfinishedOutput) {
+    std::filesystem::path output = directory / "unfinished.cdef";
+    std::ofstream(output) << "half";
+    struct stat st = {};
+    ASSERT_EQ(stat(output.c_str(), &st), 0);
+    unfinished_output begun = {output.c_str(), st.st_dev, st.st_ino};
+    auto begin_and_abort = [&begun] {
+        take_process();
+        set_unfinished_output(&begun);
+        held_signals held;
+        std::abort();
+    };
+    EXPECT_EXIT(begin_and_abort(), testing::KilledBySignal(SIGABRT), "");
+    EXPECT_FALSE(std::filesystem::exists(output));
+}
+
 /* Each of them is delivered at the end of the block, and not before. */
 TEST(Process, SignalsAreHeldUntilTheEndOfTheBlock) {
     static volatile sig_atomic_t received;
-    for (int signal : {SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGXCPU, SIGALRM, SIGVTALRM, SIGPROF, SIGUSR1, SIGUSR2}) {
+    for (int signal : {SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGXCPU, SIGALRM, SIGVTALRM, SIGPROF, SIGUSR1, SIGUSR2,
+                       SIGABRT, SIGIO, SIGPWR, SIGSTKFLT, SIGRTMIN}) {
         received = 0;
         auto before = std::signal(signal, [](int) { received = 1; });
         {
             held_signals held;
             raise(signal);
             EXPECT_EQ(received, 0) << signal;
+            EXPECT_FALSE(held.will_end_program()) << signal; /* it has a handler */
         }
         EXPECT_EQ(received, 1) << signal;
         std::signal(signal, before);
     }
+}
+
+TEST(Process, SignalEndsTheProgramUnlessItIsIgnored) {
+    auto before = std::signal(SIGTERM, SIG_DFL);
+    {
+        held_signals held;
+        EXPECT_FALSE(held.will_end_program());
+        raise(SIGTERM);
+        EXPECT_TRUE(held.will_end_program());
+        std::signal(SIGTERM, SIG_IGN); /* which also forgets the one that has arrived */
+        raise(SIGTERM);
+        EXPECT_FALSE(held.will_end_program());
+    }
+    std::signal(SIGTERM, before);
+}
+
+/* It is for others to decide when it arrives. */
+TEST(Process, SignalThatWasBlockedBeforeEndsNoProgram) {
+    held_signals others;
+    {
+        held_signals held;
+        raise(SIGTERM);
+        EXPECT_FALSE(held.will_end_program());
+    }
+    auto before = std::signal(SIGTERM, SIG_IGN); /* forgets the one that has arrived */
+    std::signal(SIGTERM, before);
+}
+
+/* Signals that end no program, or report a defect, or stop one. */
+TEST(Process, OtherSignalsAreNotHeld) {
+    sigset_t ending = ending_signals();
+    for (int signal : {SIGCHLD, SIGCONT, SIGURG, SIGWINCH, SIGTSTP, SIGTTIN, SIGTTOU, SIGSEGV, SIGILL, SIGFPE, SIGTRAP,
+                       SIGSYS, SIGPIPE, SIGXFSZ})
+        EXPECT_EQ(sigismember(&ending, signal), 0) << signal;
 }
 
 } // namespace

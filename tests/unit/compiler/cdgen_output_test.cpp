@@ -409,6 +409,18 @@ TEST_F(ImageFile, OfAnotherThatTookTheNameStays) {
     EXPECT_FALSE(std::filesystem::exists(output));
 }
 
+TEST_F(ImageFile, IsCutIfItIsShorterThanItWasFilled) {
+    write_output("1234");
+    unfinished_output filled = begun();
+    EXPECT_FALSE(filled.is_cut()) << "it is not mapped yet";
+    filled.fd = open(output.c_str(), O_RDWR | O_CLOEXEC);
+    filled.size = 4;
+    EXPECT_FALSE(filled.is_cut());
+    ASSERT_EQ(ftruncate(filled.fd, 3), 0);
+    EXPECT_TRUE(filled.is_cut());
+    close(filled.fd);
+}
+
 /* ---- Locks ----------------------------------------------------------------------------------------------------- */
 
 TEST_F(ImageFile, ThatIsLockedIsRefusedAndStays) {

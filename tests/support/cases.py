@@ -5,6 +5,7 @@ import os
 import pathlib
 import resource
 import shutil
+import signal
 import subprocess
 
 import compare
@@ -17,6 +18,10 @@ BEFORE = b"what stood here before"
 BLOCK = 1024  # the output is filled by blocks of that size
 NOBODY = 65534
 LINE = 253  # characters of the longest line, without its newline
+# Signals that end a program, and that neither cdgen nor cdef build survives. Neither leaves anything unfinished.
+ENDING = (signal.SIGHUP, signal.SIGINT, signal.SIGQUIT, signal.SIGTERM, signal.SIGXCPU, signal.SIGALRM,
+          signal.SIGVTALRM, signal.SIGPROF, signal.SIGUSR1, signal.SIGUSR2, signal.SIGABRT, signal.SIGIO,
+          signal.SIGPWR, signal.SIGSTKFLT, signal.SIGRTMIN, signal.SIGRTMAX)
 
 HEAD = b"""\
 ControlDefinition

@@ -9,12 +9,9 @@ import subprocess
 
 import pytest
 
-from cases import BEFORE, HEAD, OUT, SOURCE, TIMEOUT, attributes, check
+from cases import BEFORE, ENDING, HEAD, OUT, SOURCE, TIMEOUT, attributes, check
 from traced import TRACE, continued, ended, ended_by, stopped, struck, traced, wait_until_stopped
 
-ENDING = (signal.SIGHUP, signal.SIGINT, signal.SIGQUIT, signal.SIGTERM, signal.SIGXCPU, signal.SIGALRM,
-          signal.SIGVTALRM, signal.SIGPROF, signal.SIGUSR1, signal.SIGUSR2, signal.SIGABRT, signal.SIGIO,
-          signal.SIGPWR, signal.SIGSTKFLT, signal.SIGRTMIN, signal.SIGRTMAX)
 STAGES = ("ftruncate", "writev", "mmap")  # emptying what was there, filling, mapping
 CUT = (1, b"", b"Cannot map CDB file: it was cut while it was written\n")
 

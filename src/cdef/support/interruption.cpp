@@ -2,6 +2,8 @@
 
 #include "cdef/support/interruption.h"
 
+#include "compiler/cdgen_process.h"
+
 #include <atomic>
 #include <condition_variable>
 #include <mutex>
@@ -10,15 +12,11 @@ namespace cdef {
 
 namespace {
 
-/* The signals that end a program and do not report a defect of it, except those that are ignored, as under nohup. */
-sigset_t ending_signals() {
-    sigset_t set;
-    sigemptyset(&set);
-    for (int signal : {SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGXCPU, SIGALRM, SIGPROF, SIGVTALRM, SIGUSR1, SIGUSR2}) {
-        struct sigaction action = {};
-        if (sigaction(signal, nullptr, &action) == 0 && action.sa_handler != SIG_IGN)
-            sigaddset(&set, signal);
-    }
+/* All that end a program without reporting a defect of it: those of the compiler, and the one for closed pipes, which
+ * no uninterrupted work writes to. */
+sigset_t held_back() {
+    sigset_t set = ending_signals();
+    sigaddset(&set, SIGPIPE);
     return set;
 }
 
@@ -57,7 +55,7 @@ std::atomic<bool> watch_is_over = false;
 
 uninterrupted::uninterrupted() : before() {
     all_work.begin();
-    sigset_t held = ending_signals();
+    sigset_t held = held_back();
     pthread_sigmask(SIG_BLOCK, &held, &before);
 }
 
@@ -66,7 +64,7 @@ uninterrupted::~uninterrupted() {
     pthread_sigmask(SIG_SETMASK, &before, nullptr);
 }
 
-interruption_watch::interruption_watch() : watched(ending_signals()), before() {
+interruption_watch::interruption_watch() : watched(held_back()), before() {
     sigaddset(&watched, SIGUSR2); /* ends the watch, too */
     pthread_sigmask(SIG_BLOCK, &watched, &before);
     watch_is_over = false;

@@ -66,6 +66,20 @@ TEST_F(Interruption, WorkComesToItsEndBeforeTheProgramDoes) {
     EXPECT_EQ(notes(), 1);
 }
 
+/* Also of those that usually do not come from another program. */
+TEST_F(Interruption, AllSignalsThatEndTheProgramWait) {
+    for (int number : {SIGABRT, SIGBUS, SIGIO, SIGPIPE, SIGPWR, SIGSTKFLT, SIGRTMIN}) {
+        int status = end_of([this, number] {
+            signal(number, SIG_DFL);
+            cdef::uninterrupted work;
+            kill(getpid(), number);
+            note();
+        });
+        EXPECT_TRUE(is_ended_by(status, number)) << number;
+    }
+    EXPECT_EQ(notes(), 7);
+}
+
 TEST_F(Interruption, SoDoesTheWorkOfThreads) {
     int status = end_of([this] {
         cdef::interruption_watch watch;

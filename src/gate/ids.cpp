@@ -79,12 +79,12 @@ std::optional<std::string> unescaped(std::string_view field) {
     return text;
 }
 
-constexpr std::array recorded_kinds = {node_kind::persistent_attribute,
-                                       node_kind::dynamic_attribute,
-                                       node_kind::persistent_class_attribute,
-                                       node_kind::dynamic_class_attribute,
-                                       node_kind::action,
-                                       node_kind::class_action};
+constexpr auto recorded_kinds = std::array{node_kind::persistent_attribute,
+                                           node_kind::dynamic_attribute,
+                                           node_kind::persistent_class_attribute,
+                                           node_kind::dynamic_class_attribute,
+                                           node_kind::action,
+                                           node_kind::class_action};
 
 std::optional<node_kind> kind_called(std::string_view text) {
     const auto *found = std::find_if(recorded_kinds.begin(), recorded_kinds.end(),

@@ -19,7 +19,7 @@ struct definition_row {
     name_kind kind;
 };
 
-constexpr std::array definitions = {
+constexpr auto definitions = std::array{
     definition_row{SC_RESOURCE_CLASS, name_kind::resource_class},
     definition_row{SC_PERSISTENT_RESOURCE_ATTRIBUTE, name_kind::persistent_resource},
     definition_row{SC_PERSISTENT_CLASS_ATTRIBUTE, name_kind::persistent_class},

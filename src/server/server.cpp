@@ -30,7 +30,7 @@ struct request_row {
     json (*answer)(session &, const json &params);
 };
 
-constexpr std::array requests = {
+constexpr auto requests = std::array{
     request_row{"textDocument/hover", hover},
     request_row{"textDocument/diagnostic", document_diagnostic},
     request_row{"workspace/diagnostic", workspace_diagnostic},
@@ -55,7 +55,7 @@ struct notification_row {
     void (*take)(session &, const json &params);
 };
 
-constexpr std::array notifications = {
+constexpr auto notifications = std::array{
     notification_row{"textDocument/didOpen", did_open},
     notification_row{"textDocument/didChange", did_change},
     notification_row{"textDocument/didClose", did_close},

@@ -20,7 +20,7 @@ namespace cdef {
 namespace {
 
 /* Errors with which a database can still be shown. */
-constexpr std::array tolerated = {cdb::CODE_CHECKSUM, cdb::CODE_RESERVED};
+constexpr auto tolerated = std::array{cdb::CODE_CHECKSUM, cdb::CODE_RESERVED};
 
 bool tolerable(const cdb::finding &finding) {
     return finding.broken->level == cdb::severity::warning ||

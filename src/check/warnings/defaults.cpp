@@ -93,7 +93,8 @@ bool has_name(std::string_view list, std::string_view name) {
 class invalid_default : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE, AT_RANGE, AT_PATTR_PROPS};
+    static constexpr auto types =
+        std::array{AT_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE, AT_RANGE, AT_PATTR_PROPS};
 
     void value(const view &see) override {
         touched = true;

@@ -49,7 +49,7 @@ std::optional<lone_character> lone_in(std::string_view text) {
 class unbalanced : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_STRING};
+    static constexpr auto types = std::array{AT_STRING};
 
     void value(const view &see) override {
         std::string_view name = name_of(see.attr());

@@ -82,7 +82,7 @@ private:
 class narrowed : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_LOCATOR, AT_STRING, AT_ID};
+    static constexpr auto types = std::array{AT_LOCATOR, AT_STRING, AT_ID};
 
     void value(const view &see) override {
         if (see.attr().ta_type == AT_LOCATOR)
@@ -201,7 +201,7 @@ public:
 class low_above_high : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_VARIETY, AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_RANGE};
+    static constexpr auto types = std::array{AT_VARIETY, AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_RANGE};
 
     void value(const view &see) override {
         bool variety = see.attr().ta_type == AT_VARIETY;

@@ -15,7 +15,7 @@ namespace {
 class overlap : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_VARIETY, AT_VALID_VALUE, AT_SD_VALID_VALUE};
+    static constexpr auto types = std::array{AT_VARIETY, AT_VALID_VALUE, AT_SD_VALID_VALUE};
 
     void value(const view &see) override {
         take(see, see.attr().ta_type == AT_VARIETY ? varieties : values);

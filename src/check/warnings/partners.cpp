@@ -24,7 +24,7 @@ vx_uint16_t number_in(const view &see) {
 class no_expression : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_STRING, AT_UINT16};
+    static constexpr auto types = std::array{AT_STRING, AT_UINT16};
 
     void value(const view &see) override {
         std::string_view name = name_of(see.attr());
@@ -64,7 +64,7 @@ private:
 class group : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_UINT16};
+    static constexpr auto types = std::array{AT_UINT16};
 
     void value(const view &see) override {
         constexpr vx_uint16_t NO_GROUP = 255;
@@ -123,7 +123,7 @@ private:
 class intervals : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_UINT16};
+    static constexpr auto types = std::array{AT_UINT16};
 
     void value(const view &see) override {
         std::string_view name = name_of(see.attr());
@@ -153,7 +153,7 @@ private:
 class class_bit : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_ID, AT_STRING};
+    static constexpr auto types = std::array{AT_ID, AT_STRING};
 
     void value(const view &see) override {
         constexpr long CLASS_BIT = 0x8000;

@@ -10,7 +10,7 @@ namespace check {
 
 namespace {
 
-constexpr std::array DYNAMIC = {SC_DYNAMIC_RESOURCE_ATTRIBUTE, SC_DYNAMIC_CLASS_ATTRIBUTE};
+constexpr auto DYNAMIC = std::array{SC_DYNAMIC_RESOURCE_ATTRIBUTE, SC_DYNAMIC_CLASS_ATTRIBUTE};
 
 bool is_dynamic(int kind) {
     return kind == SC_DYNAMIC_RESOURCE_ATTRIBUTE || kind == SC_DYNAMIC_CLASS_ATTRIBUTE;
@@ -22,7 +22,7 @@ bool is_dynamic(int kind) {
 class range_elsewhere : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_RANGE, AT_DATA_TYPE};
+    static constexpr auto types = std::array{AT_RANGE, AT_DATA_TYPE};
 
     void value(const view &see) override {
         if (!is_dynamic(see.known.kind) || !is_numeric(see.compiler.data_type()))

@@ -81,8 +81,8 @@ private:
 class overridden : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_DEFAULT_VALUE, AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_VALUE_DISPLAY,
-                                         AT_SD_VALUE_DISPLAY};
+    static constexpr auto types =
+        std::array{AT_DEFAULT_VALUE, AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_VALUE_DISPLAY, AT_SD_VALUE_DISPLAY};
 
     void value(const view &see) override {
         switch (see.attr().ta_type) {

@@ -46,7 +46,7 @@ private:
 class sd_without_run : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_DATA_TYPE};
+    static constexpr auto types = std::array{AT_DATA_TYPE};
 
     void value(const view &see) override {
         latest.take_value(see);
@@ -67,7 +67,7 @@ private:
 class sd_run_at_end : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_DATA_TYPE};
+    static constexpr auto types = std::array{AT_DATA_TYPE};
 
     void value(const view &see) override {
         latest.take_value(see);

@@ -51,7 +51,7 @@ void to_lower(std::string_view text, std::string &lower) {
 class same_name : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_STRING, AT_SD_NAME};
+    static constexpr auto types = std::array{AT_STRING, AT_SD_NAME};
 
     void value(const view &see) override {
         int kind = see.known.kind;
@@ -121,7 +121,7 @@ private:
 class same_id : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_ID};
+    static constexpr auto types = std::array{AT_ID};
 
     void value(const view &see) override {
         if (int first = see.known.declared.earlier_id; first != 0)

@@ -54,7 +54,7 @@ std::string hex_text(const std::string &bytes) {
 class lost_bytes : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
+    static constexpr auto types = std::array{AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
 
     void value(const view &see) override {
         if (!is_binary(see) ||
@@ -93,8 +93,8 @@ private:
 class comment_in_value : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_STRING,      AT_SD_NAME,        AT_MANAGER,       AT_LOCATOR,
-                                         AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
+    static constexpr auto types = std::array{AT_STRING,      AT_SD_NAME,        AT_MANAGER,       AT_LOCATOR,
+                                             AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
 
     void value(const view &see) override {
         std::string_view rest = see.comment_at_value();
@@ -130,7 +130,7 @@ private:
 class comma_list : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
+    static constexpr auto types = std::array{AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
 
     void value(const view &see) override {
         if (!is_string(see) && !is_binary(see))
@@ -171,8 +171,8 @@ private:
 class outer_blank : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_STRING,      AT_SD_NAME,        AT_MANAGER,       AT_LOCATOR,
-                                         AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
+    static constexpr auto types = std::array{AT_STRING,      AT_SD_NAME,        AT_MANAGER,       AT_LOCATOR,
+                                             AT_VALID_VALUE, AT_SD_VALID_VALUE, AT_DEFAULT_VALUE, AT_INITIAL_VALUE};
 
     void value(const view &see) override {
         std::string_view text = see.value();

@@ -40,7 +40,7 @@ correction likely(const view &see, const mention &given, const language::name_li
 class unknown_locator : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_LOCATOR};
+    static constexpr auto types = std::array{AT_LOCATOR};
 
     void value(const view &see) override {
         locator = see.value_mention();
@@ -71,7 +71,7 @@ private:
 class unknown_variable_class : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_STRING};
+    static constexpr auto types = std::array{AT_STRING};
 
     void value(const view &see) override {
         if (name_of(see.attr()) != "VariableClass")
@@ -123,7 +123,7 @@ bool is_dynamic(int kind) {
 class unused_variable_class : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_STRING};
+    static constexpr auto types = std::array{AT_STRING};
 
     void value(const view &see) override {
         if (name_of(see.attr()) != "VariableClass")

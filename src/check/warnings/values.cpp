@@ -16,7 +16,7 @@ namespace {
 class unused_default : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_DEFAULT_VALUE};
+    static constexpr auto types = std::array{AT_DEFAULT_VALUE};
 
     void value(const view &see) override {
         if (see.known.kind == SC_PERSISTENT_CLASS_ATTRIBUTE)
@@ -28,7 +28,7 @@ public:
 class permission : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_PERMISSION};
+    static constexpr auto types = std::array{AT_PERMISSION};
 
     void value(const view &see) override {
         std::string_view text = see.value();
@@ -47,7 +47,7 @@ public:
 class element_type : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_SD_DATA_TYPE};
+    static constexpr auto types = std::array{AT_SD_DATA_TYPE};
 
     void value(const view &see) override {
         if (see.compiler.data_type() != VX_UNKNOWN || see.compiler.run_makes_value())
@@ -61,7 +61,7 @@ public:
 class ignored_range : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_RANGE};
+    static constexpr auto types = std::array{AT_RANGE};
 
     void value(const view &see) override {
         switch (scalar_vx(see.compiler.data_type())) {
@@ -88,7 +88,7 @@ private:
 class properties : public watcher {
 public:
     using watcher::watcher;
-    static constexpr std::array types = {AT_CLASS_PROPS, AT_PATTR_PROPS, AT_DATTR_PROPS, AT_ACTION_PROPS};
+    static constexpr auto types = std::array{AT_CLASS_PROPS, AT_PATTR_PROPS, AT_DATTR_PROPS, AT_ACTION_PROPS};
 
     void value(const view &see) override {
         std::string_view list = see.value();

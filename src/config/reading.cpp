@@ -36,14 +36,11 @@ std::string expected(std::string_view what, const toml::node &value) {
     return std::string("expected ").append(what).append(", found ").append(kind_of(value));
 }
 
-const language::name_list &warning_names() {
-    static const language::name_list names = [] {
-        language::name_list all = {"all"};
-        for (const check::warning &known : check::warnings)
-            all.insert(all.end(), {known.name, known.code});
-        return all;
-    }();
-    return names;
+language::name_list warning_names() {
+    language::name_list all = {"all"};
+    for (const check::warning &known : check::warnings)
+        all.insert(all.end(), {known.name, known.code});
+    return all;
 }
 
 bool is_among(std::string_view text, const language::name_list &names) {

@@ -17,7 +17,7 @@
 #include <csignal>
 #include <cstdlib>
 #include <filesystem>
-#include <map>
+#include <iterator>
 #include <memory>
 #include <set>
 #include <sys/time.h>
@@ -31,10 +31,22 @@ namespace {
 using build_command::build_run;
 using build_command::outcome;
 
-const std::map<std::string, build::byte_order> byte_orders = {{"native", build::byte_order::native},
-                                                              {"little", build::byte_order::little},
-                                                              {"big", build::byte_order::big},
-                                                              {"both", build::byte_order::both}};
+struct byte_order_row {
+    std::string_view name;
+    build::byte_order order;
+};
+
+constexpr byte_order_row byte_orders[] = {{"big", build::byte_order::big},
+                                          {"both", build::byte_order::both},
+                                          {"little", build::byte_order::little},
+                                          {"native", build::byte_order::native}};
+
+/* The name is one of them. */
+build::byte_order byte_order_named(std::string_view name) {
+    return std::find_if(std::begin(byte_orders), std::end(byte_orders),
+                        [name](const byte_order_row &each) { return each.name == name; })
+        ->order;
+}
 
 struct build_options {
     std::vector<std::string> operands;
@@ -66,7 +78,7 @@ orb_timeval32_t wanted_time(const build_options &options) {
 /* The settings from the options or, where an option is missing, from the project file. */
 build::naming naming_of(const build_options &options, const config::settings &settings) {
     std::string order = options.order.value_or(settings.byte_order.empty() ? "native" : settings.byte_order);
-    build::naming how = {options.file, options.directory, byte_orders.at(order)};
+    build::naming how = {options.file, options.directory, byte_order_named(order)};
     if (!how.file && !how.directory && !settings.directory.empty())
         how.directory = settings.directory;
     return how;
@@ -165,8 +177,9 @@ int build_or_refuse(const build_options &options) {
 }
 
 std::vector<std::string> names_of_orders() {
-    std::vector<std::string> names(byte_orders.size());
-    std::transform(byte_orders.begin(), byte_orders.end(), names.begin(), [](const auto &each) { return each.first; });
+    std::vector<std::string> names(std::size(byte_orders));
+    std::transform(std::begin(byte_orders), std::end(byte_orders), names.begin(),
+                   [](const byte_order_row &each) { return std::string(each.name); });
     return names;
 }
 

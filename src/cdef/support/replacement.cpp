@@ -239,7 +239,7 @@ void replace_target(const std::string &target, std::string_view contents, const 
 /* Writing beyond a limit for the size of files then fails with an error. The signal would end the program with the
  * temporary file in place. */
 void ignore_size_limit_signal() {
-    [[maybe_unused]] static const auto former = signal(SIGXFSZ, SIG_IGN);
+    signal(SIGXFSZ, SIG_IGN);
 }
 
 /* Enough to distinguish names with the same beginning. */

@@ -21,7 +21,7 @@ ALLOWED = {
         r"report::all_rules\(\)::all": "put together once, then constant",
     },
     "cdef": {
-        r"cdef::\(anonymous namespace\)::(all_work|watch_is_over)": "signals end all work of the process",
+        r"cdef::\(anonymous namespace\)::all_work": "signals end all work of the process",
         r"cdef::gate_command::git\(.*\)::environment": "put together once, then constant",
         r"cdef::source::\(anonymous namespace\)::require_plain<.*>\(.*\)::constants": "put together once, then constant",
         r"cdef::source::lines_of\(stanza_id\)::all": "put together once, then constant",
@@ -37,7 +37,8 @@ def writable(archive):
     """The names of all variables in writable sections of object files, except those that the compiler itself adds."""
     command = ["objdump", "--syms", "--demangle", archive]
     listed = subprocess.run(command, capture_output=True, text=True, check=True).stdout
-    return {name.removeprefix("guard variable for ") for name in WRITABLE.findall(listed) if not name.startswith(".")}
+    names = {name for name in WRITABLE.findall(listed) if not name.startswith(".")}
+    return {name.removeprefix("guard variable for ").removesuffix("[abi:cxx11]") for name in names}
 
 
 def library(folder):

@@ -4,7 +4,6 @@
 
 #include "compiler/cdgen_process.h"
 
-#include <atomic>
 #include <condition_variable>
 #include <mutex>
 
@@ -49,7 +48,6 @@ private:
 };
 
 work_count all_work;
-std::atomic<bool> watch_is_over = false;
 
 } // namespace
 
@@ -67,7 +65,6 @@ uninterrupted::~uninterrupted() {
 interruption_watch::interruption_watch() : watched(held_back()), before() {
     sigaddset(&watched, SIGUSR2); /* ends the watch, too */
     pthread_sigmask(SIG_BLOCK, &watched, &before);
-    watch_is_over = false;
     try {
         watcher = std::thread([this] { watch(); });
     } catch (...) {
@@ -77,7 +74,7 @@ interruption_watch::interruption_watch() : watched(held_back()), before() {
 }
 
 interruption_watch::~interruption_watch() {
-    watch_is_over = true;
+    is_over = true;
     pthread_kill(watcher.native_handle(), SIGUSR2);
     watcher.join();
     pthread_sigmask(SIG_SETMASK, &before, nullptr);
@@ -85,7 +82,7 @@ interruption_watch::~interruption_watch() {
 
 void interruption_watch::watch() {
     int signal = 0;
-    while (sigwait(&watched, &signal) == 0 && !watch_is_over) {
+    while (sigwait(&watched, &signal) == 0 && !is_over) {
         struct sigaction action = {};
         if (sigaction(signal, nullptr, &action) == 0 && action.sa_handler == SIG_IGN)
             continue;

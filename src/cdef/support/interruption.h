@@ -2,6 +2,7 @@
 #ifndef CDGEN_CDEF_INTERRUPTION_H
 #define CDGEN_CDEF_INTERRUPTION_H
 
+#include <atomic>
 #include <csignal>
 #include <thread>
 
@@ -36,6 +37,7 @@ private:
 
     sigset_t watched;
     sigset_t before;
+    std::atomic<bool> is_over = false;
     std::thread watcher;
 };
 

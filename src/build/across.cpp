@@ -70,10 +70,10 @@ class_facts facts_of(const check::view &source, std::span<const std::byte> image
                                           std::string(each.alias()),
                                           each.record().rvc_obsv_interval,
                                           each.record().rvc_report_interval});
-    const std::vector<mention> &names = source.known.variable_class_names;
+    const check::kept_lines &names = source.known.variable_classes;
     for (size_t i = 0; i < names.size() && names.size() == facts.variable_classes.size(); ++i) {
         variable_class &named = facts.variable_classes[i];
-        named.name = found_in_file(source, {names[i].at, named.name.text, names[i].source});
+        named.name = found_in_file(source, {names.at(i), named.name.text, std::string(names.line_of(i))});
     }
     return facts;
 }

@@ -48,6 +48,7 @@ int first_lines::find(std::string_view text, unsigned tag) const {
 
 std::vector<std::string_view> first_lines::all() const {
     std::vector<std::string_view> names;
+    names.reserve(entries.size());
     for (size_t position = 1; position <= entries.size(); ++position)
         names.push_back(text_of(position));
     return names;

@@ -5,6 +5,7 @@
 
 #include "check/check.h"
 #include "check/first_lines.h"
+#include "check/kept_lines.h"
 #include "check/number_lines.h"
 #include "language/names.h"
 
@@ -166,8 +167,8 @@ struct knowledge {
     int overflow_line = 0;           /* of the latest number whose overflow affects later ones; 0: none */
     int map_line = 0;                /* header of the latest ClassToManagerMapping; 0: none */
     std::vector<mention> map_values; /* of all its attributes; the texts are the attributes' names */
-    std::vector<int> class_lines;    /* of the headers of all ResourceClasses */
-    std::vector<mention> variable_class_names;
+    std::vector<int> class_lines;    /* of the headers of all ResourceClasses; only if a database is made */
+    kept_lines variable_classes;     /* their names; only if a database is made */
 };
 
 } // namespace check

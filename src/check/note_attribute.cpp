@@ -9,8 +9,8 @@ void recovery::note_mapping_or_variable_class(bool first) {
     std::string_view name = name_of(see.attr());
     if (known.kind == SC_CLASS_TO_MANAGER_MAPPING)
         known.map_values.push_back({see.value_place(), std::string(name), std::string(line.raw)});
-    else if (first && name == "VariableClass")
-        known.variable_class_names.push_back(see.value_mention());
+    else if (first && name == "VariableClass" && compiler.output() != nullptr)
+        known.variable_classes.add(see.value_place(), line.raw);
 }
 
 /* In place, since this is done for each attribute and element. */

@@ -109,7 +109,7 @@ void recovery::open_stanza(int kind, bool broken) {
     stanza.source = line.raw;
     if (kind == SC_CLASS_TO_MANAGER_MAPPING)
         known.map_line = line.number;
-    if (kind == SC_RESOURCE_CLASS)
+    if (kind == SC_RESOURCE_CLASS && compiler.output() != nullptr)
         known.class_lines.push_back(line.number);
 }
 

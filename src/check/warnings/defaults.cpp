@@ -1,5 +1,6 @@
 /* defaults.cpp: a warning about default and initial values that are not valid themselves. */
 
+#include "check/kept_lines.h"
 #include "check/value_keys.h"
 #include "check/warnings/watcher.h"
 #include "format/data_types.h"
@@ -9,42 +10,10 @@
 #include <string>
 #include <string_view>
 #include <utility>
-#include <vector>
 
 namespace check {
 
 namespace {
-
-/* Lines of a stanza, kept until its end. */
-class kept_lines {
-public:
-    struct value {
-        place at;
-        size_t begin; /* of its line, in the texts */
-    };
-
-    void add(const view &see) {
-        values.push_back({see.value_place(), texts.size()});
-        texts += see.line.raw;
-    }
-    void clear() {
-        values.clear();
-        texts.clear();
-    }
-    std::string_view line_of(size_t position) const {
-        size_t end = position + 1 < values.size() ? values[position + 1].begin : texts.size();
-        return std::string_view(texts).substr(0, end).substr(values[position].begin);
-    }
-    std::string_view text_of(size_t position) const {
-        const place &at = values[position].at;
-        return line_of(position).substr(at.column - 1, at.length);
-    }
-
-    std::vector<value> values;
-
-private:
-    std::string texts;
-};
 
 /* A text that is cut short has a warning of its own. */
 bool is_whole(const view &see, vx_data_type_t type) {
@@ -136,13 +105,13 @@ private:
         if (!is_vx_array(type))
             defaults.clear();
         if (is_whole(see, type))
-            defaults.add(see);
+            defaults.add(see.value_place(), see.line.raw);
     }
 
     void look_at_given(vx_data_type_t type) {
-        for (size_t i = 0; i < defaults.values.size(); ++i)
+        for (size_t i = 0; i < defaults.size(); ++i)
             if (std::optional<value_key> key = key_of(type, defaults.text_of(i)); is_excluded(key))
-                explain(report(defaults.values[i].at, defaults.line_of(i), "this value " + reason(key)), key,
+                explain(report(defaults.at(i), defaults.line_of(i), "this value " + reason(key)), key,
                         "choose another value, or allow this one");
     }
 
@@ -177,7 +146,7 @@ private:
     }
 
     allowed_values valid, range;
-    kept_lines defaults;
+    kept_lines defaults; /* of the stanza, until its end */
     bool touched = false; /* the stanza has any of these attributes */
     bool has_default = false;
     bool is_required = false; /* clients that define a resource must give it */

@@ -2,13 +2,13 @@
  * unless a line or a stanza that was not understood may have, or use, the name. */
 
 #include "check/first_lines.h"
+#include "check/kept_lines.h"
 #include "check/warnings/watcher.h"
 
 #include <algorithm>
 #include <optional>
 #include <string>
 #include <utility>
-#include <vector>
 
 namespace check {
 
@@ -82,7 +82,7 @@ public:
         }
         int &first = used_lines.line_of(see.value());
         if (first == 0)
-            used.push_back(see.value_mention());
+            used.add(see.value_place(), see.line.raw);
         first = see.line.number;
     }
 
@@ -97,9 +97,10 @@ public:
             return;
         language::name_list names = defined.all();
         size_t compared = 0;
-        for (const mention &each : used) {
-            if (defined.has(each.text))
+        for (size_t i = 0; i < used.size(); ++i) {
+            if (defined.has(used.text_of(i)))
                 continue;
+            const mention each = {used.at(i), std::string(used.text_of(i)), std::string(used.line_of(i))};
             bool suggests = (compared += names.size()) <= COMPARED_MAX;
             finding &found = report(each.at, each.source, "no `ResourceVariableClass` has this name");
             advise(found, cure(suggests ? language::suggestion(each.text, names) : std::string()));
@@ -109,7 +110,7 @@ public:
     }
 
 private:
-    std::vector<mention> used; /* by attributes, each name once */
+    kept_lines used; /* by attributes, each name once */
     first_lines used_lines;
     first_lines defined;
     bool unnamed = false; /* a variable class lacks its name: it may be any of those that are used */
@@ -131,7 +132,7 @@ public:
         bool defines = see.known.kind == SC_RESOURCE_VARIABLE_CLASS;
         int &first = (defines ? defined_lines : used).line_of(see.value());
         if (defines && first == 0)
-            defined.push_back(see.value_mention());
+            defined.add(see.value_place(), see.line.raw);
         first = see.line.number;
     }
 
@@ -146,14 +147,14 @@ public:
         if (!all_known || use_lost || lost.may_be(SC_DYNAMIC_RESOURCE_ATTRIBUTE) ||
             lost.may_be(SC_DYNAMIC_CLASS_ATTRIBUTE))
             return;
-        for (const mention &each : defined)
-            if (!used.has(each.text))
-                advise(report(each.at, each.source, "no dynamic attribute belongs to this variable class"),
+        for (size_t i = 0; i < defined.size(); ++i)
+            if (!used.has(defined.text_of(i)))
+                advise(report(defined.at(i), defined.line_of(i), "no dynamic attribute belongs to this variable class"),
                        "remove it, or give attributes its name");
     }
 
 private:
-    std::vector<mention> defined; /* each name once */
+    kept_lines defined; /* each name once */
     first_lines defined_lines;
     first_lines used;
     bool use_lost = false; /* an attribute may have one of these names in a line that was not understood */

@@ -1,0 +1,55 @@
+/* kept_lines.h: places of a source, each with the text of its line. There may be very many. */
+#ifndef CDGEN_CHECK_KEPT_LINES_H
+#define CDGEN_CHECK_KEPT_LINES_H
+
+#include "check/check.h"
+#include "language/limits.h"
+
+#include <cstddef>
+#include <limits>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace check {
+
+class kept_lines {
+public:
+    /* A part of one line. The places in the file are not kept. */
+    void add(const place &at, std::string_view source);
+    void clear();
+
+    size_t size() const {
+        return entries.size();
+    }
+    place at(size_t position) const {
+        const entry &each = entries[position];
+        return {each.line, each.column, each.length};
+    }
+    std::string_view line_of(size_t position) const {
+        size_t end = position + 1 < entries.size() ? entries[position + 1].begin : texts.size();
+        return std::string_view(texts).substr(0, end).substr(entries[position].begin);
+    }
+    /* The part. */
+    std::string_view text_of(size_t position) const {
+        return line_of(position).substr(entries[position].column - size_t{1}, entries[position].length);
+    }
+
+private:
+    using small = unsigned char; /* a line is short */
+    static_assert(LINE_MAX_CHARS <= std::numeric_limits<small>::max());
+
+    struct entry {
+        size_t begin; /* in texts; it ends where the next one begins */
+        int line;
+        small column;
+        small length;
+    };
+
+    std::string texts;
+    std::vector<entry> entries;
+};
+
+} // namespace check
+
+#endif

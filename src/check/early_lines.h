@@ -6,6 +6,7 @@
 #include "check/current_line.h"
 
 #include <string>
+#include <vector>
 
 namespace check {
 
@@ -13,13 +14,10 @@ class early_lines {
 public:
     /* The optional attribute of a line has been reported as too early. */
     void open(int line) {
+        close();
         first = line;
-        moved = {};
-        text.clear();
     }
-    void close() {
-        first = 0;
-    }
+    void close();
     bool is_open() const {
         return first != 0;
     }
@@ -27,16 +25,19 @@ public:
         return first;
     }
 
-    /* Notes that the current line is to be moved. */
+    /* Notes that the current line is to be moved. More lines than a reader could look at are not moved, because an edit
+     * takes more memory than its line. */
     void move(const current_line &line);
 
     /* Moves the lines after the current one. */
     correction after(const current_line &line);
 
 private:
-    int first = 0; /* 0: no line is too early */
-    correction moved;
-    std::string text; /* of the lines */
+    static constexpr size_t MOVED_MAX = 4096;
+
+    int first = 0;          /* 0: no line is too early */
+    std::string text;       /* of the lines, each with its newline */
+    std::vector<int> lines; /* their numbers in the file */
 };
 
 } // namespace check

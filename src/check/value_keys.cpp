@@ -77,35 +77,113 @@ key_ranges::range key_ranges::add(range given) {
         single = std::move(given);
         return {};
     }
-    if (single) {
-        add_to_map(std::move(*single));
-        single.reset();
-    }
-    return add_to_map(std::move(given));
+    if (single)
+        add_to_chunks(*std::exchange(single, std::nullopt));
+    return add_to_chunks(given);
 }
 
-key_ranges::range key_ranges::add_to_map(range given) {
+key_ranges::range key_ranges::add_to_chunks(const range &given) {
+    size_t texts_before = texts.size();
+    packed low = pack(given.low);
+    entry added = {low, given.high == given.low ? low : pack(given.high), given.line};
     range earlier;
-    auto after = by_low.upper_bound(given.high);
-    while (after != by_low.begin()) {
-        auto each = std::prev(after);
-        if (each->second.high < given.low)
+    bool is_within = false;
+    position after = first_above(view_of(added.high));
+    for (; after.index > 0; after = first_above(view_of(added.high))) {
+        position at = {after.chunk, after.index - 1};
+        entry each = chunks[at.chunk][at.index];
+        if (view_of(each.high) < view_of(added.low))
             break;
-        earlier = {each->first, each->second.high, each->second.line};
-        given.low = std::min(given.low, each->first);
-        given.high = std::max(given.high, each->second.high);
-        given.line = std::min(given.line, each->second.line);
-        after = by_low.erase(each);
+        earlier = {unpack(each.low), unpack(each.high), each.line};
+        bool begins = view_of(each.low) <= view_of(added.low);
+        bool ends = view_of(added.high) <= view_of(each.high);
+        is_within = begins && ends;
+        added = {begins ? each.low : added.low, ends ? each.high : added.high, std::min(added.line, each.line)};
+        erase(at);
     }
-    by_low.emplace_hint(after, std::move(given.low), rest{std::move(given.high), given.line});
+    if (is_within)
+        texts.resize(texts_before);
+    insert(after, added);
     return earlier;
+}
+
+key_ranges::packed key_ranges::pack(const value_key &key) {
+    if (key.text.empty())
+        return key.number;
+    auto length = static_cast<std::uint16_t>(key.text.size());
+    auto begin = static_cast<packed>(texts.size() + 1);
+    texts += static_cast<char>(length >> 8);
+    texts += static_cast<char>(length & 0xFF);
+    texts += key.text;
+    return begin;
+}
+
+key_ranges::key_view key_ranges::view_of(packed key) const {
+    if (texts.empty())
+        return {key, {}};
+    if (key == 0)
+        return {0, {}};
+    auto at = static_cast<size_t>(key) - 1;
+    size_t length = size_t{static_cast<unsigned char>(texts[at])} << 8 | static_cast<unsigned char>(texts[at + 1]);
+    return {0, std::string_view(texts).substr(at + 2, length)};
+}
+
+value_key key_ranges::unpack(packed key) const {
+    key_view view = view_of(key);
+    return {view.number, std::string(view.text)};
+}
+
+/* Where the first range that begins above a key is, or would be. The range before it, if there is one, is in the same
+ * chunk. */
+key_ranges::position key_ranges::first_above(const key_view &key) const {
+    auto is_below = [this](const key_view &wanted, const entry &each) { return wanted < view_of(each.low); };
+    auto next = std::upper_bound(chunks.begin(), chunks.end(), key, [&](const key_view &wanted, const chunk &each) {
+        return is_below(wanted, each.front());
+    });
+    if (next == chunks.begin())
+        return {0, 0};
+    const chunk &in = *std::prev(next);
+    auto at = std::upper_bound(in.begin(), in.end(), key, is_below);
+    return {static_cast<size_t>(next - chunks.begin()) - 1, static_cast<size_t>(at - in.begin())};
+}
+
+/* A full chunk is halved, except at the end of all: most values ascend. */
+void key_ranges::insert(position at, const entry &added) {
+    bool at_end = at.chunk + 1 >= chunks.size() && (chunks.empty() || at.index == chunks.back().size());
+    if (at_end && (chunks.empty() || at.index == CHUNK_MAX)) {
+        chunks.push_back({added});
+        return;
+    }
+    chunk &in = chunks[at.chunk];
+    in.insert(in.begin() + static_cast<std::ptrdiff_t>(at.index), added);
+    if (in.size() <= CHUNK_MAX)
+        return;
+    auto middle = in.begin() + CHUNK_MAX / 2;
+    chunk second(middle, in.end());
+    in.erase(middle, in.end());
+    chunks.insert(chunks.begin() + static_cast<std::ptrdiff_t>(at.chunk) + 1, std::move(second));
+}
+
+void key_ranges::erase(position at) {
+    chunk &in = chunks[at.chunk];
+    in.erase(in.begin() + static_cast<std::ptrdiff_t>(at.index));
+    if (in.empty())
+        chunks.erase(chunks.begin() + static_cast<std::ptrdiff_t>(at.chunk));
 }
 
 bool key_ranges::has(const value_key &key) const {
     if (single)
         return single->low <= key && key <= single->high;
-    auto after = by_low.upper_bound(key);
-    return after != by_low.begin() && key <= std::prev(after)->second.high;
+    position after = first_above(view_of(key));
+    return after.index > 0 && view_of(key) <= view_of(chunks[after.chunk][after.index - 1].high);
+}
+
+void key_ranges::clear() {
+    single.reset();
+    if (chunks.empty())
+        return;
+    chunks.clear();
+    texts.clear();
 }
 
 } // namespace check

@@ -6,11 +6,11 @@
 
 #include <compare>
 #include <cstdint>
-#include <map>
 #include <optional>
 #include <string>
 #include <string_view>
 #include <tuple>
+#include <vector>
 
 namespace check {
 
@@ -34,7 +34,8 @@ std::optional<value_key> key_of(vx_data_type_t type, std::string_view text);
 /* The key of a type's default value: 0 or empty. */
 std::optional<value_key> default_key(vx_data_type_t type);
 
-/* Ranges that do not overlap; those that would are united. Each takes the line that it was given in. */
+/* Ranges that do not overlap; those that would are united. Each takes the line that it was given in. There may be very
+ * many, so they are kept in chunks, without a node for each. */
 class key_ranges {
 public:
     struct range {
@@ -47,24 +48,46 @@ public:
     range add(range given);
     bool has(const value_key &key) const;
     bool empty() const {
-        return !single && by_low.empty();
+        return !single && chunks.empty();
     }
-    void clear() {
-        single.reset();
-        if (!by_low.empty())
-            by_low.clear();
-    }
+    void clear();
 
 private:
-    struct rest {
-        value_key high;
+    /* A number, or for texts the position in `texts`, from 1, of a key's text; 0 is the empty text. */
+    using packed = std::int64_t;
+    struct entry {
+        packed low, high;
         int line;
     };
+    using chunk = std::vector<entry>; /* never empty */
+    struct key_view {
+        std::strong_ordering operator<=>(const key_view &other) const {
+            return std::tie(number, text) <=> std::tie(other.number, other.text);
+        }
 
-    range add_to_map(range given);
+        std::int64_t number;
+        std::string_view text;
+    };
+    struct position {
+        size_t chunk, index;
+    };
+
+    range add_to_chunks(const range &given);
+    packed pack(const value_key &key);
+    key_view view_of(packed key) const;
+    static key_view view_of(const value_key &key) {
+        return {key.number, key.text};
+    }
+    value_key unpack(packed key) const;
+    position first_above(const key_view &key) const;
+    void insert(position at, const entry &added);
+    void erase(position at);
+
+    static constexpr size_t CHUNK_MAX = 512;
 
     std::optional<range> single; /* the only range: most stanzas have one, which needs no memory of its own */
-    std::map<value_key, rest> by_low;
+    std::vector<chunk> chunks;   /* all ranges, ascending */
+    std::string texts;           /* each after the two bytes of its length */
 };
 
 } // namespace check

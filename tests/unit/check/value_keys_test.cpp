@@ -79,4 +79,36 @@ TEST(KeyRanges, HaveWhatIsInOneOfThem) {
     EXPECT_FALSE(ranges.has(*key_of(VX_INT32, "1")));
 }
 
+/* The values 0, 7, 14, ... modulo a prime come in no order. */
+TEST(KeyRanges, KeepManyInAnyOrder) {
+    constexpr int PRIME = 2003;
+    key_ranges numbers, texts;
+    auto text_of = [](int value) {
+        return check::value_key{0, std::string(static_cast<size_t>(value % 251), 'x') + "\1"};
+    };
+    for (int i = 0; i < PRIME; ++i)
+        EXPECT_EQ(numbers.add({{i * 7 % PRIME * 2, {}}, {i * 7 % PRIME * 2, {}}, i + 1}).line, 0);
+    for (int i = 0; i < PRIME; ++i) {
+        EXPECT_TRUE(numbers.has({2 * i, {}})) << i;
+        EXPECT_FALSE(numbers.has({2 * i + 1, {}})) << i;
+    }
+    EXPECT_EQ(numbers.add({{14, {}}, {14, {}}, 9999}).line, 2);
+    for (int i = 0; i < 251; ++i)
+        EXPECT_EQ(texts.add({text_of(i * 7), text_of(i * 7), i + 1}).line, 0);
+    EXPECT_EQ(texts.add({text_of(14), text_of(14), 9999}).line, 3);
+}
+
+/* The shorter text comes first; the empty text is below all others. */
+TEST(KeyRanges, UniteRangesOfTexts) {
+    key_ranges ranges;
+    EXPECT_EQ(ranges.add({{}, {}, 1}).line, 0);
+    EXPECT_EQ(ranges.add({{0, "b"}, {0, "d"}, 2}).line, 0);
+    EXPECT_EQ(ranges.add({{0, "f"}, {0, "h"}, 3}).line, 0);
+    EXPECT_EQ(ranges.add({{0, "c"}, {0, "g"}, 4}).line, 2);
+    EXPECT_EQ(ranges.add({{0, "e"}, {0, "e"}, 5}).high, (check::value_key{0, "h"}));
+    EXPECT_TRUE(ranges.has({}));
+    EXPECT_FALSE(ranges.has({0, "a"}));
+    EXPECT_FALSE(ranges.has({0, "ha"}));
+}
+
 } // namespace

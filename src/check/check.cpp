@@ -18,7 +18,9 @@ namespace check {
 
 namespace {
 
-constexpr size_t RETURNS_MAX = 65536; /* the most carriage returns that are removed together, to limit memory */
+/* To limit memory, at most this many carriage returns are removed together, or one for each of so many lines. */
+constexpr size_t RETURNS_MAX = 8192;
+constexpr size_t LINES_FOR_RETURN = 128;
 
 /* One check of one source, whose name must outlive it. */
 struct source_check {
@@ -49,7 +51,8 @@ struct source_check {
 
 /* Notes how to remove the carriage returns at the end of the line. True if the last one is to be ignored. */
 [[gnu::noinline]] bool source_check::take_returns() {
-    if (std::optional<edit> removal = line.without_returns(); removal && returns.size() < RETURNS_MAX)
+    size_t most = std::max(RETURNS_MAX, static_cast<size_t>(line.number) / LINES_FOR_RETURN);
+    if (std::optional<edit> removal = line.without_returns(); removal && returns.size() < most)
         returns.push_back(std::move(*removal));
     return recover.strips_returns() && line.raw.ends_with('\r');
 }

@@ -117,6 +117,17 @@ struct lost_stanzas {
 
 /* The latest run of elements. */
 struct element_run {
+    /* Adds to one of the lists; so many are enough to see what is wrong. */
+    static void add(std::vector<mention> &to, const mention &element) {
+        constexpr size_t LISTED_MAX = 1024;
+        if (to.size() < LISTED_MAX)
+            to.push_back(element);
+    }
+    /* True if the header of an element without ElementIndex is in this line. */
+    bool lists_without_index(int line) const {
+        return !without_index.empty() && line >= without_index.front().at.line && line <= without_index.back().at.line;
+    }
+
     int kind = SC_PATTR_SD_DEFINITION;
     std::vector<mention> odd_types;     /* DataTypes of elements for which the run's default may fail */
     bool odd_type_reported = false;     /* there were others, which have been reported */

@@ -21,7 +21,7 @@ void recovery::note_data_type() {
     given.source = line.raw;
     bool odd = compiler.data_type() == VX_UNKNOWN || given.text == "SBS";
     if (see.attr().ta_type == AT_SD_DATA_TYPE && odd && compiler.run_makes_value())
-        known.run.odd_types.push_back(given);
+        element_run::add(known.run.odd_types, given);
 }
 
 void recovery::declare_name() {

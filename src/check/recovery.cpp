@@ -65,12 +65,11 @@ bool recovery::is_reported_otherwise(const fatal_exit &failure) const {
 }
 
 bool recovery::may_retract(warning_id id, int at_line) const {
-    const std::vector<mention> &without = known.run.without_index;
     switch (id) {
     case NARROWED:
         return at_line == known.overflow_line;
     case INCOMPLETE:
-        return at_line == known.map_line || (!without.empty() && at_line >= without.front().at.line);
+        return at_line == known.map_line || known.run.lists_without_index(at_line);
     case ELEMENT_TYPE:
         return known.kind >= 0 && at_line == known.stanza().data_type.at.line;
     default:
@@ -110,7 +109,7 @@ void recovery::end_stanza(int next_kind) {
     early.close();
     warned.stanza_end(see, next_kind);
     if (known.kind >= 0 && is_sd_kind(known.kind) && !lacking_unnoticed(see, next_kind).empty())
-        known.run.without_index.push_back({known.stanza().header, {}, known.stanza().source});
+        element_run::add(known.run.without_index, {known.stanza().header, {}, known.stanza().source});
 }
 
 /* Stanzas before the class, or without any, are checked in a class of their own. */

@@ -39,19 +39,35 @@ bool is_free(const changed_places &changed, const edit &each) {
     return free_after && (next == changed.begin() || std::prev(next)->second <= begin_of(each));
 }
 
-/* Where each line begins. */
-std::vector<size_t> lines_of(std::string_view source) {
-    std::vector<size_t> begins = {0};
-    for (size_t at = source.find('\n'); at != std::string_view::npos; at = source.find('\n', at + 1))
-        begins.push_back(at + 1);
-    return begins;
-}
+/* A line of a text. Its next lines are found one by one, because a list of all would take more memory than they do. */
+class line_finder {
+public:
+    explicit line_finder(std::string_view source) : text(source) {}
 
-std::vector<edit> in_order(std::span<const correction> all) {
-    std::vector<edit> edits;
+    /* Moves forward to a line; false if the text has no such line. */
+    bool go_to(int wanted) {
+        for (; line < wanted; ++line) {
+            size_t newline = text.find('\n', begin);
+            if (newline == std::string_view::npos)
+                return false;
+            begin = newline + 1;
+        }
+        return line == wanted;
+    }
+
+    size_t begin = 0;
+
+private:
+    std::string_view text;
+    int line = 1;
+};
+
+std::vector<const edit *> in_order(std::span<const correction> all) {
+    std::vector<const edit *> edits;
     for (const correction &each : all)
-        edits.insert(edits.end(), each.edits.begin(), each.edits.end());
-    std::stable_sort(edits.begin(), edits.end(), comes_first);
+        for (const edit &one : each.edits)
+            edits.push_back(&one);
+    std::stable_sort(edits.begin(), edits.end(), [](const edit *a, const edit *b) { return comes_first(*a, *b); });
     return edits;
 }
 
@@ -83,18 +99,18 @@ std::vector<correction> compatible(std::vector<correction> all) {
 }
 
 std::optional<std::string> corrected(std::string_view source, std::span<const correction> all) {
-    std::vector<size_t> lines = lines_of(source);
+    line_finder line(source);
     std::string made;
+    made.reserve(source.size() + source.size() / 8);
     size_t taken = 0;
-    for (const edit &each : in_order(all)) {
-        auto line = static_cast<size_t>(each.line) - 1;
-        if (line >= lines.size() || each.column > source.size() - lines[line] + 1)
+    for (const edit *each : in_order(all)) {
+        if (!line.go_to(each->line) || each->column > source.size() - line.begin + 1)
             return std::nullopt;
-        size_t begin = lines[line] + each.column - 1;
-        if (begin < taken || source.substr(begin, each.removed.size()) != each.removed)
+        size_t begin = line.begin + each->column - 1;
+        if (begin < taken || source.substr(begin, each->removed.size()) != each->removed)
             return std::nullopt;
-        made.append(source.substr(taken, begin - taken)).append(each.text);
-        taken = begin + each.removed.size();
+        made.append(source.substr(taken, begin - taken)).append(each->text);
+        taken = begin + each->removed.size();
     }
     return made.append(source.substr(taken));
 }

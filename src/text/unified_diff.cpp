@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cstddef>
+#include <cstdint>
 #include <utility>
 #include <vector>
 
@@ -14,18 +15,41 @@ namespace {
 constexpr std::size_t CONTEXT = 3; /* lines shown before and after a change */
 constexpr std::size_t WINDOW = 64; /* how many lines ahead to look for a line that both texts have */
 
-using line_list = std::vector<std::string_view>;
-
-/* With their newlines. */
-line_list lines_of(std::string_view text) {
-    line_list lines;
-    while (!text.empty()) {
-        std::size_t length = std::min(text.find('\n'), text.size() - 1) + 1;
-        lines.push_back(text.substr(0, length));
-        text.remove_prefix(length);
+/* The lines of a text, with their newlines. There may be very many, so only 32 bits of each offset are kept. */
+class line_list {
+public:
+    explicit line_list(std::string_view whole) : text(whole) {
+        begins.reserve(static_cast<std::size_t>(std::count(text.begin(), text.end(), '\n')) + 1);
+        for (std::size_t begin = 0, next = 0; begin < text.size(); begin = next) {
+            while (carries.size() < std::uint64_t{begin} >> BITS)
+                carries.push_back(begins.size());
+            begins.push_back(static_cast<std::uint32_t>(begin));
+            next = std::min(text.find('\n', begin), text.size() - 1) + 1;
+        }
     }
-    return lines;
-}
+
+    std::size_t size() const {
+        return begins.size();
+    }
+    /* Where a line begins; the text's end for the line after the last one. */
+    std::size_t begin_of(std::size_t line) const {
+        if (line == begins.size())
+            return text.size();
+        auto carried = std::upper_bound(carries.begin(), carries.end(), line) - carries.begin();
+        return static_cast<std::size_t>((static_cast<std::uint64_t>(carried) << BITS) + begins[line]);
+    }
+    std::string_view operator[](std::size_t line) const {
+        std::size_t begin = begin_of(line);
+        return text.substr(begin, begin_of(line + 1) - begin);
+    }
+
+private:
+    static constexpr int BITS = 32;
+
+    std::string_view text;
+    std::vector<std::uint32_t> begins;
+    std::vector<std::size_t> carries; /* the first lines that begin at or after each multiple of 4 GiB */
+};
 
 /* A range of lines in both texts; the end is the line after the last. */
 struct range {
@@ -109,15 +133,12 @@ void add_hunk(std::string &to, const comparison &both, const change *first, cons
 } // namespace
 
 std::vector<line_change> changed_lines(std::string_view before, std::string_view after) {
-    comparison both = {lines_of(before), lines_of(after)};
-    auto begin_of = [](const line_list &lines, std::string_view text, std::size_t line) {
-        return line == lines.size() ? text.size() : static_cast<std::size_t>(lines[line].data() - text.data());
-    };
+    comparison both = {line_list(before), line_list(after)};
     std::vector<line_change> all;
     for (const change &each : both.changes()) {
-        std::size_t begin = begin_of(both.after, after, each.after.begin);
-        std::size_t end = begin_of(both.after, after, each.after.end);
-        all.push_back({begin_of(both.before, before, each.before.begin), begin_of(both.before, before, each.before.end),
+        std::size_t begin = both.after.begin_of(each.after.begin);
+        std::size_t end = both.after.begin_of(each.after.end);
+        all.push_back({both.before.begin_of(each.before.begin), both.before.begin_of(each.before.end),
                        after.substr(begin, end - begin)});
     }
     return all;
@@ -125,7 +146,7 @@ std::vector<line_change> changed_lines(std::string_view before, std::string_view
 
 std::string unified_diff(std::string_view old_name, std::string_view new_name, std::string_view before,
                          std::string_view after) {
-    comparison both = {lines_of(before), lines_of(after)};
+    comparison both = {line_list(before), line_list(after)};
     std::vector<change> changes = both.changes();
     if (changes.empty())
         return {};

@@ -12,7 +12,7 @@ namespace cdef {
 
 namespace {
 
-std::string for_output(const std::string &diff) {
+std::string for_output(std::string diff) {
     if (isatty(STDOUT_FILENO) == 0)
         return diff;
     std::string shown;

@@ -146,7 +146,7 @@ private:
     }
 
     allowed_values valid, range;
-    kept_lines defaults; /* of the stanza, until its end */
+    kept_lines defaults;  /* of the stanza, until its end */
     bool touched = false; /* the stanza has any of these attributes */
     bool has_default = false;
     bool is_required = false; /* clients that define a resource must give it */

@@ -9,6 +9,7 @@ import tempfile
 import unittest
 
 from installed import BUILD, PROJECT, Case, run
+from programs import PROGRAMS
 from documents import broken_links
 
 
@@ -94,7 +95,8 @@ class Reproducible(Case):
             (copy / name).parent.mkdir(parents=True, exist_ok=True)
             shutil.copy(PROJECT / name, copy / name)
         build = self.here / "b"
-        run("cmake", "--preset", "package", "-S", copy, "-B", build, cwd=copy)
+        options = [f"-D{name}={PROGRAMS.cache[name]}" for name in ("CDGEN_TOGETHER", "CMAKE_CXX_FLAGS_RELEASE")]
+        run("cmake", "--preset", "package", *options, "-S", copy, "-B", build, cwd=copy)
         run("cmake", "--build", build)
         for name in ("cdgen", "cdef", "src/reader/libcdb_view.a"):
             self.assertTrue((build / name).read_bytes() == (BUILD / name).read_bytes(), name)

@@ -2,6 +2,7 @@
 
 #include "check/found_in.h"
 #include "compiler/stepwise.h"
+#include "sample.h"
 
 namespace {
 
@@ -43,7 +44,10 @@ TEST(Check, TakesSourcesLargerThanTheReadBuffer) {
 TEST(Check, ShowsEachLineAsItWasRead) {
     std::string source = CLASS;
     std::vector<std::string> expected;
+    sampling::sample lines = sampling::of_this_run();
     for (int i = 0; i < 20000; ++i) {
+        if (!lines.takes())
+            continue;
         expected.push_back("Unknown" + std::to_string(i) + "=\"" + std::string(static_cast<size_t>(i) % 100, 'x') +
                            "\"  #");
         source += expected.back() + "\n";

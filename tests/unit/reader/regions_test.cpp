@@ -5,6 +5,7 @@
 
 #include "places.h"
 #include "reader/image_files.h"
+#include "sample.h"
 
 #include <filesystem>
 #include <fstream>
@@ -262,12 +263,15 @@ TEST(CdbRegions, TileWhatIsCut) {
 }
 
 TEST(CdbRegions, TileWhatIsDamaged) {
+    sampling::sample changes = sampling::of_this_run();
     for (std::endian order : both_orders) {
         exact_copy copy(load("small", order));
         for (std::byte &changed : copy.bytes()) {
             const std::byte was = changed;
             const unsigned n = std::to_integer<unsigned>(was);
             for (unsigned now : {0x00u, 0xFFu, n ^ 1, n ^ 0x80, (n + 1) & 0xFF, (n + 8) & 0xFF}) {
+                if (!changes.takes())
+                    continue;
                 changed = std::byte(now);
                 EXPECT_TRUE(tiles(copy.bytes())) << "byte " << &changed - copy.bytes().data() << " is " << now;
             }

@@ -17,7 +17,7 @@ namespace {
 constexpr int ROUNDS_MAX = 200; /* the most rounds; few are needed */
 
 /* To limit memory, a round makes at most this many edits, or one for each of so many bytes. */
-constexpr size_t EDITS_MAX = 8192;
+constexpr size_t EDITS_MAX = 16384;
 constexpr size_t BYTES_FOR_EDIT = 256;
 
 /* One round: makes the corrections of a text, except those after which there would be more errors. The first `skipped`

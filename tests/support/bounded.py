@@ -15,9 +15,13 @@ MEGABYTES = 1 << 20
 
 def run_bounded(directory, command, *inputs):
     """The status, and the output on both streams."""
+    return run_within(directory, 8 * sum(path.stat().st_size for path in inputs) + 16 * MEGABYTES, command, *inputs)
+
+
+def run_within(directory, bound, command, *inputs):
+    """The same with a bound of its own, in bytes."""
     if PROGRAMS.sanitizers or not PROGRAMS.is_on("CDGEN_STATIC"):
         pytest.skip("a sanitizer or a shared library takes address space of its own")
-    bound = 8 * sum(path.stat().st_size for path in inputs) + 16 * MEGABYTES
     with (directory / "out").open("wb") as out, (directory / "err").open("wb") as err:
         result = subprocess.run([*command, *inputs], stdout=out, stderr=err, timeout=3600, check=False,
                                 preexec_fn=lambda: resource.setrlimit(resource.RLIMIT_AS, (bound, bound)))

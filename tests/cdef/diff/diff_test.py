@@ -27,6 +27,7 @@ import pytest
 
 import cdb_image
 import make_images
+from bounded import MEGABYTES, run_bounded
 from compare import same
 from expectation import Expectation
 from programs import PROGRAMS, PROJECT, TESTS
@@ -578,6 +579,18 @@ def test_values_that_lead_to_one_text_too_often_are_refused(programs):
     # In JSON each path begins with the class's name.
     message = "cdef: few.cdef, many.cdef: too many references lead to the same values or texts\n"
     same(programs.diff("--json", "few.cdef", "many.cdef"), (2, "", message), "a long name")
+
+
+@pytest.mark.parametrize("form", ["text", "json"])
+def test_forged_databases_take_no_more_memory(programs, form):
+    """Than 8 times the files and 16 MB, although thousands of values and names lead to the same 32,767 characters."""
+    few, many = programs.directory / "few.cdef", programs.directory / "many.cdef"
+    for forged in same_text, values_of_another:
+        few.write_bytes(forged(10, 32767))
+        many.write_bytes(forged(2000, 32767))
+        status, out, _ = run_bounded(programs.directory, [PROGRAMS.cdef, "diff", "--format", form], few, many)
+        assert status in (1, 2)
+        assert out.stat().st_size <= MEGABYTES + 16 * (few.stat().st_size + many.stat().st_size)
 
 
 def test_one_may_be_standard_input(programs):

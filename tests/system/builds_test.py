@@ -62,7 +62,7 @@ def tracer():
 def traced(world, options, *arguments, **more):
     """Starts a build under the tracer."""
     started = world.options(**more)
-    started["env"]["ASAN_OPTIONS"] = "detect_leaks=0"
+    started["env"]["ASAN_OPTIONS"] = "detect_leaks=0:handle_sigbus=0"  # SIGBUS ends the program as without a sanitizer
     command = [tracer(), "-qq", "-o", world.path("trace"), *options, world.cdef, *(arguments or BUILD)]
     return subprocess.Popen(command, stdout=subprocess.PIPE, stderr=subprocess.PIPE, **started)
 

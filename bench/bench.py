@@ -197,13 +197,13 @@ def judge_throughput(bench, costs, sizes, runs):
 
 
 def judge_largest(bench):
-    """Adds the memory target for a source of 1 GB, which is read once and then removed."""
+    """Adds the memory target for a source of 1 GB, which is removed afterwards."""
     say("a large source")
     path = bench.directory / "largest.cdefsrc"
     with open(path, "w", encoding="ascii") as file:
         file.writelines(generate.large_source(bench.plan.largest, bench.plan.large))
     size = path.stat().st_size
-    cost = measure.median(bench.launcher.runs(bench.job(path)._replace(repeat=1)))
+    cost = measure.median(bench.launcher.runs(bench.job(path)._replace(repeat=3)))
     output = (bench.directory / "out.cdef").stat().st_size
     path.unlink()
     bench.add(f"{bench.plan.largest} classes of as many mixed attributes", size, cost,

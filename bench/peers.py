@@ -6,13 +6,15 @@ written as is usual in that program's language.
 """
 
 import shlex
+import struct
 import typing
 import xml.sax.saxutils
 
-from generate import definitions
+from generate import TYPES, definitions
 
 INTEGER_TYPES = ("Int32", "UInt32", "Int64", "UInt64")
 FLOAT_TYPES = ("Float32", "Float64")
+ROW_BYTES = 4  # of a glyph
 GROUP = 100  # definitions in a group, for programs whose time grows with the square of the length of a list
 
 
@@ -180,25 +182,46 @@ BDF_HEAD = """\
 STARTFONT 2.1
 FONT -bench-definitions-medium-r-normal--8-80-75-75-c-80-iso10646-1
 SIZE 8 75 75
-FONTBOUNDINGBOX 32 8 0 0
+FONTBOUNDINGBOX 32 32 0 0
 STARTPROPERTIES 2
-FONT_ASCENT 8
+FONT_ASCENT 32
 FONT_DESCENT 0
 ENDPROPERTIES
 CHARS {count}
 """
 
 
+PROPERTIES = ("ReqdForDefine", "Public")
+BINARY_FORMS = {"Int32": ">i", "UInt32": ">I", "Int64": ">q", "UInt64": ">Q", "Float32": ">f", "Float64": ">d"}
+
+
+def value_bytes(definition, text):
+    """A value in binary form; a text by its characters."""
+    form = BINARY_FORMS.get(scalar(definition))
+    if form is None:
+        return text.encode("ascii")
+    return struct.pack(form, float(text) if scalar(definition) in FLOAT_TYPES else int(text))
+
+
+def bitmap(d):
+    """What a definition has besides its name, as rows of 32 bits. Properties have a bit each."""
+    properties = sum(1 << PROPERTIES.index(name) for name in d.properties)
+    numbers = (d.description, d.display, d.number, TYPES.index(d.data_type), *d.varieties, d.group, d.group_name,
+               properties)
+    values = b"".join(value_bytes(d, text) for text in (d.low, d.high, d.default))
+    bits = struct.pack(">9I", *numbers) + values + bytes(-len(values) % ROW_BYTES)
+    return [bits[at:at + ROW_BYTES].hex().upper() for at in range(0, len(bits), ROW_BYTES)]
+
+
 def bdf(count):
-    """A bitmap font with a glyph for each definition, whose numbers are the rows of the glyph."""
+    """A bitmap font with a glyph for each definition."""
     yield BDF_HEAD.format(count=count)
     for index, d in enumerate(definitions(count)):
-        numbers = (d.description, d.display, d.number, d.varieties[0], d.varieties[1], d.group, d.group_name,
-                   d.number + 1)
-        rows = "".join(f"{value:08X}\n" for value in numbers)
+        rows = bitmap(d)
+        lines = "".join(f"{row}\n" for row in rows)
         yield (f"STARTCHAR {d.name}\nENCODING {index}\n"
                f"SWIDTH {d.description % 1000} 0\nDWIDTH {1 + d.display % 100} 0\n"
-               f"BBX 32 8 0 0\nBITMAP\n{rows}ENDCHAR\n")
+               f"BBX 32 {len(rows)} 0 0\nBITMAP\n{lines}ENDCHAR\n")
     yield "ENDFONT\n"
 
 

@@ -43,11 +43,12 @@ def empty_classes(directory, name):
 
 
 def run_on(directory, command, *paths):
-    """Runs a program on databases within the memory limit. With few records, only their files and 8 MB: what is kept of
-    each record would be hidden in the 16 MB."""
+    """Runs a program on databases within the memory limit. With few records, only the program, their files and 4 MB:
+    what is kept of each record would be hidden in the 16 MB."""
     if RECORDS > 1_000_000:
         return run_bounded(directory, command, *paths)
-    return run_within(directory, sum(path.stat().st_size for path in paths) + 8 * MEGABYTES, command, *paths)
+    files = sum(path.stat().st_size for path in (command[0], *paths))
+    return run_within(directory, files + 4 * MEGABYTES, command, *paths)
 
 
 def empty_anchors(directory):

@@ -1,6 +1,5 @@
 /* usage.h: what is wrong with a command line. The library that reads command lines has texts for that too, but they
- * differ between its versions, and it accepts flags that
- * have values. */
+ * differ between its versions, and it accepts values for flags that take none. */
 #ifndef CDGEN_CDEF_USAGE_H
 #define CDGEN_CDEF_USAGE_H
 
@@ -46,7 +45,7 @@ private:
     void look_at_long(const std::string &word, const std::string *next);
     void look_at_short(const std::string &word, const std::string *next);
     void look_at_operand(const std::string &word);
-    /* value: null if there is none. */
+    /* value: null if the command line ends before it. */
     void take_value(CLI::Option &option, const std::string &name, const std::string *value);
     void take_flag(CLI::Option &flag, const std::string &word);
     void fail(const std::string &what);

@@ -42,8 +42,8 @@ public:
     held_signals &operator=(const held_signals &) = delete;
     ~held_signals();
 
-    /* True if a signal has arrived that will end the program when it is no longer held back. The output has to be
-     * removed before that. */
+    /* True if a signal is pending that ends the program as soon as it is let through. The output has to be removed
+     * before that. */
     bool will_end_program() const;
 
 private:

@@ -53,7 +53,8 @@ def test_an_id_moves_with_its_line():
     ([], "95", 0),
 ])
 def test_status(verdicts, at_least, status, directory, monkeypatch):
-    """Only a share that is asked for and not reached is a failure. Without any judged change there is no share."""
+    """It is a failure only if a share is asked for and the tests noticed less. Before a change has been judged, there is
+    no share."""
     every = list(MUTATE.mutants_of("x.cpp", "a == b;\n" * 20))
     monkeypatch.setattr(MUTATE, "mutants", lambda seed, only: every)
     monkeypatch.setattr(MUTATE, "RESULTS", directory / "results.jsonl")

@@ -16,7 +16,7 @@ namespace {
 
 constexpr int ROUNDS_MAX = 200; /* the most rounds; few are needed */
 
-/* To limit memory, a round makes at most this many edits, or one for each of so many bytes. */
+/* To limit memory, a round makes no more edits than this, or than one for each 256 bytes of a large source. */
 constexpr size_t EDITS_MAX = 16384;
 constexpr size_t BYTES_FOR_EDIT = 256;
 
@@ -58,6 +58,8 @@ public:
     bool is_last_of_text() const {
         return is_last;
     }
+
+private:
     /* Makes the corrections together; if that causes more errors, tries each half of them. */
     void make(std::span<const correction> some) {
         if (some.empty() || try_with(some))

@@ -134,11 +134,17 @@ struct element_run {
     std::vector<mention> without_index; /* headers of elements without ElementIndex, since the latest wrong index */
 };
 
-/* Names and Ids that the current class gives, or for elements the current run. Kept only for the warnings that look at
- * them. */
+/* Names and Ids that the current class gives, or for elements the current run, or for variable classes the source. Kept
+ * only for the warnings that look at them. */
 struct declarations {
     explicit declarations(const warning_set &wanted)
-        : keeps_names(wanted[SAME_NAME] || wanted[UNKNOWN_LOCATOR]), keeps_ids(wanted[SAME_ID]) {}
+        : keeps_names(wanted[SAME_NAME] || wanted[UNKNOWN_LOCATOR] || wanted[UNKNOWN_VARIABLE_CLASS] ||
+                      wanted[UNUSED_VARIABLE_CLASS]),
+          keeps_ids(wanted[SAME_ID]) {}
+
+    const first_lines &variable_classes() const {
+        return names[SC_RESOURCE_VARIABLE_CLASS];
+    }
 
     bool keeps_names;
     bool keeps_ids;

@@ -26,7 +26,9 @@ void recovery::note_data_type() {
 
 void recovery::declare_name() {
     std::string_view attr = name_of(see.attr());
-    if ((attr != "Name" && attr != "ElementName") || known.kind == SC_RESOURCE_CLASS)
+    bool is_variable_class = attr == "VariableClass" && known.kind == SC_RESOURCE_VARIABLE_CLASS;
+    bool is_name = attr == "Name" || attr == "ElementName";
+    if (!is_variable_class && (!is_name || known.kind == SC_RESOURCE_CLASS))
         return;
     int &first = known.declared.names[index_of(known.kind)].line_of(see.value());
     known.declared.earlier_name = first;

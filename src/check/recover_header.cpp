@@ -24,14 +24,16 @@ bool wants_class(message_id id) {
            id == MSG_NO_CLASS_FOR_ACTION || id == MSG_NO_CLASS_FOR_SD;
 }
 
-/* Names and Ids must differ within a class, and those of elements within their run. */
+/* Names and Ids must differ within a class, and those of elements within their run. Variable classes are those of the
+ * whole source. */
 void forget_declarations(declarations &declared, int next_kind, bool begins_run, bool begins_class) {
     if (begins_run)
         declared.names[index_of(next_kind)].clear();
     if (!begins_class)
         return;
-    for (first_lines &names : declared.names)
-        names.clear();
+    for (size_t kind = 0; kind < SC_COUNT; ++kind)
+        if (kind != SC_RESOURCE_VARIABLE_CLASS)
+            declared.names[kind].clear();
     for (number_lines &ids : declared.ids)
         ids.clear();
 }

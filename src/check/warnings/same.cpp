@@ -59,7 +59,7 @@ public:
         bool is_name = attr == "Name" || attr == "ElementName" || attr == "VariableClass";
         if (!is_name || kind == SC_RESOURCE_CLASS || (attr == "VariableClass" && kind != SC_RESOURCE_VARIABLE_CLASS))
             return;
-        int first = earlier(see);
+        int first = see.known.declared.earlier_name;
         int without_case = earlier_without_case(see);
         if (first != 0 || without_case != 0)
             look_at(see, first, without_case);
@@ -93,16 +93,6 @@ private:
                           {{without_case, 0, 0}, "the other one"}),
                    "rename one of them, or spell them alike if they are meant to be one");
     }
-    /* The line that gave the current line's name first; 0: none did. */
-    int earlier(const view &see) {
-        if (see.known.kind != SC_RESOURCE_VARIABLE_CLASS)
-            return see.known.declared.earlier_name;
-        int &line = variable_classes.line_of(see.value());
-        int first = line;
-        if (first == 0)
-            line = see.line.number;
-        return first;
-    }
     int earlier_without_case(const view &see) {
         std::optional<int> partner = partner_of(see.known.kind);
         to_lower(see.value(), lower);
@@ -113,7 +103,6 @@ private:
         return first;
     }
 
-    first_lines variable_classes;
     std::array<first_lines, SC_COUNT> lower_names; /* partners share the lower kind's */
     std::string lower;
 };

@@ -74,12 +74,8 @@ public:
     static constexpr auto types = std::array{AT_STRING};
 
     void value(const view &see) override {
-        if (name_of(see.attr()) != "VariableClass")
+        if (name_of(see.attr()) != "VariableClass" || see.known.kind == SC_RESOURCE_VARIABLE_CLASS)
             return;
-        if (see.known.kind == SC_RESOURCE_VARIABLE_CLASS) {
-            defined.line_of(see.value()) = see.line.number;
-            return;
-        }
         int &first = used_lines.line_of(see.value());
         if (first == 0)
             used.add(see.value_place(), see.line.raw);
@@ -95,6 +91,7 @@ public:
         constexpr size_t COMPARED_MAX = 1'000'000; /* names in all, for the time not to be quadratic */
         if (unnamed || see.known.lost.may_be(SC_RESOURCE_VARIABLE_CLASS))
             return;
+        const first_lines &defined = see.known.declared.variable_classes();
         language::name_list names = defined.all();
         size_t compared = 0;
         for (size_t i = 0; i < used.size(); ++i) {
@@ -112,7 +109,6 @@ public:
 private:
     kept_lines used; /* by attributes, each name once */
     first_lines used_lines;
-    first_lines defined;
     bool unnamed = false; /* a variable class lacks its name: it may be any of those that are used */
 };
 
@@ -129,11 +125,10 @@ public:
     void value(const view &see) override {
         if (name_of(see.attr()) != "VariableClass")
             return;
-        bool defines = see.known.kind == SC_RESOURCE_VARIABLE_CLASS;
-        int &first = (defines ? defined_lines : used).line_of(see.value());
-        if (defines && first == 0)
+        if (see.known.kind != SC_RESOURCE_VARIABLE_CLASS)
+            used.line_of(see.value()) = see.line.number;
+        else if (see.known.declared.earlier_name == 0)
             defined.add(see.value_place(), see.line.raw);
-        first = see.line.number;
     }
 
     void stanza_end(const view &see, int) override {
@@ -142,7 +137,8 @@ public:
     }
     void source_end(const view &see) override {
         language::name_list names = used.all();
-        bool all_known = std::all_of(names.begin(), names.end(), [&](auto name) { return defined_lines.has(name); });
+        const first_lines &known = see.known.declared.variable_classes();
+        bool all_known = std::all_of(names.begin(), names.end(), [&](auto name) { return known.has(name); });
         const lost_stanzas &lost = see.known.lost;
         if (!all_known || use_lost || lost.may_be(SC_DYNAMIC_RESOURCE_ATTRIBUTE) ||
             lost.may_be(SC_DYNAMIC_CLASS_ATTRIBUTE))
@@ -155,7 +151,6 @@ public:
 
 private:
     kept_lines defined; /* each name once */
-    first_lines defined_lines;
     first_lines used;
     bool use_lost = false; /* an attribute may have one of these names in a line that was not understood */
 };

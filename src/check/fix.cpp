@@ -26,7 +26,6 @@ class round {
 public:
     round(std::string_view bytes, const std::string &source, const warning_set &wanted, size_t skipped)
         : before(bytes), name(source), warned(wanted) {
-        std::vector<correction> certain;
         size_t most = std::max(EDITS_MAX, before.size() / BYTES_FOR_EDIT);
         size_t edits = 0;
         errors = check_bytes(before, name, warned, [&](finding &&each) {
@@ -41,18 +40,20 @@ public:
                      certain.push_back(std::move(each.fix));
                  }).errors;
         considered = certain.size();
-        make(compatible(std::move(certain)));
+        certain = compatible(std::move(certain));
+        fitting = certain.size();
+        make(fitting);
     }
 
     const std::vector<correction> &made() const {
-        return kept;
+        return certain;
     }
     size_t dropped() const {
-        return refused;
+        return fitting - certain.size();
     }
     /* Corrections that have been considered, but not made. */
     size_t left_out() const {
-        return considered - kept.size();
+        return considered - certain.size();
     }
     /* No correction is left for another round. */
     bool is_last_of_text() const {
@@ -60,54 +61,54 @@ public:
     }
 
 private:
-    /* Makes the corrections together; if that causes more errors, tries each half of them. */
-    void make(std::span<const correction> some) {
-        if (some.empty() || try_with(some))
+    /* Makes the next so many corrections together; if that causes more errors, tries each half of them. */
+    void make(size_t count) {
+        if (count == 0 || try_next(count))
             return;
-        if (some.size() == 1) {
-            ++refused;
+        if (count == 1) {
+            certain.erase(certain.begin() + static_cast<std::ptrdiff_t>(kept));
             return;
         }
-        make(some.first(some.size() / 2));
-        make(some.subspan(some.size() / 2));
+        make(count / 2);
+        make(count - count / 2);
     }
 
-    bool try_with(std::span<const correction> more) {
-        std::vector<correction> all = kept;
-        all.insert(all.end(), more.begin(), more.end());
-        std::optional<std::string> text = corrected(before, all);
+    bool try_next(size_t count) {
+        std::optional<std::string> text = corrected(before, std::span(certain).first(kept + count));
         if (!text)
             return false;
         size_t found = check_bytes(*text, name, warned, [](finding &&) {}).errors;
         if (found > errors)
             return false;
         errors = found;
-        kept = std::move(all);
+        kept += count;
         return true;
     }
 
     std::string_view before;
     const std::string &name;
     const warning_set &warned;
-    size_t errors = 0; /* with the corrections that have been made */
-    std::vector<correction> kept;
-    size_t refused = 0;
+    size_t errors = 0;               /* with the corrections that have been made */
+    std::vector<correction> certain; /* those that are refused are removed */
+    size_t kept = 0;                 /* the first so many are made; the others have not been tried */
     size_t considered = 0;
+    size_t fitting = 0; /* of those considered, how many can be made together */
     bool is_last = true;
 };
 
 } // namespace
 
 fixed_source fix_bytes(std::string_view bytes, const std::string &name, const warning_set &wanted) {
-    fixed_source fixed = {.text = std::string(bytes)};
+    fixed_source fixed;
+    std::string_view text = bytes;
     size_t skipped = 0; /* corrections that earlier rounds of this pass have not made */
     size_t made_before = 0;
     for (int left = ROUNDS_MAX; left > 0; --left) {
-        round latest(fixed.text, name, wanted, skipped);
+        round latest(text, name, wanted, skipped);
         fixed.dropped = skipped == 0 ? latest.dropped() : fixed.dropped + latest.dropped();
         fixed.corrected += latest.made().size();
         if (!latest.made().empty())
-            fixed.text = *corrected(fixed.text, latest.made());
+            text = fixed.text = *corrected(text, latest.made());
         skipped += latest.left_out();
         if (!latest.is_last_of_text())
             continue;
@@ -116,6 +117,8 @@ fixed_source fix_bytes(std::string_view bytes, const std::string &name, const wa
         made_before = fixed.corrected;
         skipped = 0;
     }
+    if (fixed.corrected == 0)
+        fixed.text = bytes;
     return fixed;
 }
 

@@ -3,12 +3,13 @@
 The limit is one of the address space, so that nothing depends on what else the machine does.
 """
 
+import os
 import resource
 import subprocess
 
 import pytest
 
-from programs import PROGRAMS
+from programs import PROGRAMS, runner
 
 MEGABYTES = 1 << 20
 
@@ -28,3 +29,15 @@ def run_within(directory, bound, command, *inputs):
     errors = (directory / "err").read_bytes()
     assert b"memory" not in errors, f"in {bound} bytes"
     return result.returncode, directory / "out", errors
+
+
+def peak_of(command):
+    """The most memory, in bytes, that a program has at any time, if that is more than the interpreter has. What it says is
+    not shown."""
+    if PROGRAMS.sanitizers or runner():
+        pytest.skip("a sanitizer or an emulator takes memory of its own")
+    with subprocess.Popen(command, stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL) as process:
+        _, status, used = os.wait4(process.pid, 0)
+        process.returncode = os.waitstatus_to_exitcode(status)
+    assert process.returncode >= 0
+    return used.ru_maxrss * 1024

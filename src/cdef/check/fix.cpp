@@ -3,6 +3,7 @@
 #include "cdef/check/fix.h"
 
 #include "cdef/support/failure.h"
+#include "cdef/support/memory.h"
 #include "cdef/support/output.h"
 #include "cdef/support/replacement.h"
 #include "cdef/support/shown_diff.h"
@@ -37,6 +38,7 @@ void say_what_was_done(const std::string &source, const check::fixed_source &fix
 } // namespace
 
 std::string fix_source(const std::string &source, const check::warning_set &wanted, bool dry_run) {
+    give_back_large_blocks(); /* each round takes and frees many */
     try {
         std::string before = text_of_file(source);
         check::fixed_source fixed = check::fix_bytes(before, source, wanted);

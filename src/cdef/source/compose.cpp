@@ -12,16 +12,12 @@
 #include "cdef/source/stanza.h"
 #include "cdef/source/structure.h"
 #include "cdef/source/text.h"
+#include "cdef/support/memory.h"
 #include "format/constants.h"
 #include "format/names.h"
 #include "text/shown.h"
 
-#include <cstdlib>
 #include <unordered_set>
-
-#if defined(__GLIBC__)
-#include <malloc.h>
-#endif
 
 namespace cdef::source {
 
@@ -270,14 +266,6 @@ void write_stanzas(source_writer &out, const class_plan &plan, const cdb::databa
     write_steps(out, plan, map_before, end);
 }
 
-/* Gives the system what has been freed. The C library keeps memory that is freed between blocks that are still used, as
- * the memory of planning is. */
-void give_back_freed_memory() {
-#if defined(__GLIBC__)
-    malloc_trim(0);
-#endif
-}
-
 } // namespace
 
 std::vector<std::size_t> own_fields(stanza_id stanza) {
@@ -290,7 +278,7 @@ std::vector<std::size_t> own_fields(stanza_id stanza) {
 
 proven_source::proven_source(const cdb::database &database, const cdb::ownership &owners)
     : db(database), plans(plans_of(db, owners)) {
-    give_back_freed_memory();
+    give_back_freed_memory(); /* that of planning lies between blocks that stay */
     output = default_name(plans);
     std::string file = output.value_or("Class") + std::string(SUFFIX);
     proof compiled(file, db, owners);

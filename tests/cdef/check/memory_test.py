@@ -8,7 +8,7 @@ import os
 
 import pytest
 
-from bounded import MEGABYTES, run_bounded, run_within
+from bounded import MEGABYTES, peak_of, run_bounded, run_within
 from compare import same
 from programs import PROGRAMS
 
@@ -144,6 +144,18 @@ def test_fix(directory, name, options):
     same(status, 1, "status")
     after = source.read_bytes() if len(options) == 1 else out.read_bytes()
     assert (b" =" in after or b"\r" in after) == (len(options) == 2)
+
+
+@pytest.mark.slow(30)
+@pytest.mark.parametrize("equals", ["=", " ="])
+def test_fix_of_variable_classes(directory, equals):
+    """Their names are kept in each round, whether there is something to correct or not. The source is so large that the
+    interpreter, which the program is forked from, takes less memory than the bound."""
+    source = write_source(directory, "ControlDefinition\nResourceClass\n",
+                          f"ResourceVariableClass\n VariableClass{equals}{{}}\n", max(LINES, 250_000))
+    bound = 8 * source.stat().st_size + 16 * MEGABYTES
+    assert peak_of([PROGRAMS.cdef, "check", "-q", "--max=1", "--fix", source]) <= bound
+    assert b" =" not in source.read_bytes()
 
 
 @pytest.mark.slow(30)

@@ -133,7 +133,7 @@ constexpr attribute_meaning attributes[] = {
     {ELEMENT, "ElementIndex", "0 for the first element of a run, one more for each that follows", "0, 1, 2 and so on"},
     {ELEMENT, "DataType", "data type; not `SD` or `SDArray`"},
     {ELEMENT, "ValidValue", "a value or a range that is valid", {}, "any value is valid"},
-    {ELEMENT, "ValueDisplayName", "message number for the valid value given last", MESSAGE_RANGE, "0, none"},
+    {ELEMENT, "ValueDisplayName", "message number for the last `ValidValue` above it", MESSAGE_RANGE, "0, none"},
     {ELEMENT, "DefaultValue", "always refused"},
 };
 

@@ -74,8 +74,12 @@ function(compile_together target)
   set_target_properties(${target} PROPERTIES UNITY_BUILD ON UNITY_BUILD_MODE GROUP)
 endfunction()
 
-foreach(target IN ITEMS cdgen_text cdb_view cdgen_language cdgen_compiler cdgen_compare cdgen_check cdgen_config
-    cdgen_report cdgen_build cdgen_formatter cdgen_index cdgen_gate cdgen_server cdef_core cdgen_unit fuzz_mutate cdef_fuzz)
+set(targets cdgen_unit fuzz_mutate cdef_fuzz)
+if(NOT CDGEN_TOGETHER STREQUAL "TESTS")
+  list(APPEND targets cdgen_text cdb_view cdgen_language cdgen_compiler cdgen_compare cdgen_check cdgen_config
+    cdgen_report cdgen_build cdgen_formatter cdgen_index cdgen_gate cdgen_server cdef_core)
+endif()
+foreach(target IN LISTS targets)
   if(TARGET ${target})
     compile_together(${target})
   endif()

@@ -4,6 +4,7 @@
 #include "fuzz/mutate.h"
 
 #include "reader/image_files.h"
+#include "sample.h"
 
 #include <gtest/gtest.h>
 
@@ -17,10 +18,14 @@ constexpr unsigned TRIES = 1500;
 
 using seen_by = std::function<bool(const cdb::database &)>;
 
+constexpr sampling::sample EACH_SEED(1, 0);
+
 /* How many of the databases that come of an image show something. */
-unsigned count_changed(std::span<const std::byte> image, const seen_by &shows) {
+unsigned count_changed(std::span<const std::byte> image, const seen_by &shows, sampling::sample seeds = EACH_SEED) {
     unsigned count = 0;
     for (unsigned seed = 1; seed <= TRIES; ++seed) {
+        if (!seeds.takes())
+            continue;
         fuzz::chance random(seed);
         fuzz::image_bytes changed = fuzz::changed_image(image, random);
         count += shows(cdb::database(changed));
@@ -53,11 +58,12 @@ protected:
 };
 
 TEST_P(mutate_image, length_and_checksum_are_right) {
-    EXPECT_EQ(count_changed(image,
-                            [](const cdb::database &db) {
-                                return db.recognised() && (breaks(db, "CDB102") || breaks(db, "CDB104"));
-                            }),
-              0U);
+    EXPECT_EQ(
+        count_changed(
+            image,
+            [](const cdb::database &db) { return db.recognised() && (breaks(db, "CDB102") || breaks(db, "CDB104")); },
+            sampling::of_this_run()),
+        0U);
 }
 
 TEST_P(mutate_image, nearly_all_remain_databases) {

@@ -3,10 +3,19 @@
 #include "check/findings.h"
 
 #include <algorithm>
+#include <iterator>
 #include <tuple>
 #include <utility>
 
 namespace check {
+
+namespace {
+
+size_t parts_of(const finding &each) {
+    return each.notes.size() + each.fix.edits.size();
+}
+
+} // namespace
 
 finding &findings::add(entry &&added) {
     make_room();
@@ -49,11 +58,15 @@ void findings::retract(warning_id id, int line) {
     }
 }
 
-finding *findings::waiting_error(message_id id, int line) {
+void findings::correct(message_id id, int line, const std::function<correction()> &fix) {
     auto found = std::find_if(waiting.begin(), waiting.end(), [&](const entry &each) {
         return each.id == WARNING_COUNT && each.found.at.line == line && each.found.code == message_of(id).code;
     });
-    return found == waiting.end() ? nullptr : &found->found;
+    if (found == waiting.end())
+        return;
+    found->found.fix = fix();
+    if (std::next(found) != waiting.end())
+        parts += found->found.fix.edits.size();
 }
 
 /* Sorts their positions first, because it takes long to move a finding. */
@@ -85,10 +98,22 @@ void findings::hand_over(entry &each) {
         to(std::move(each.found));
 }
 
-/* If too many findings are kept, passes on half of them, those of the first lines. */
+/* If too many findings are kept, or their notes and edits are too many, passes on half of them. */
 void findings::make_room() {
-    if (waiting.size() < room)
+    if (!waiting.empty())
+        parts += parts_of(waiting.back().found);
+    if (waiting.size() < room && parts < parts_room)
         return;
+    pass_on_first_half();
+    parts = 0;
+    for (const entry &each : waiting)
+        parts += parts_of(each.found);
+    room = std::max(WAITING_MAX, 2 * waiting.size());
+    parts_room = std::max(PARTS_MAX, 2 * parts);
+}
+
+/* Those of the first lines. */
+void findings::pass_on_first_half() {
     sort();
     std::vector<entry> kept;
     kept.reserve(waiting.size());
@@ -101,7 +126,6 @@ void findings::make_room() {
             hand_over(each);
     }
     waiting = std::move(kept);
-    room = std::max(WAITING_MAX, 2 * waiting.size());
 }
 
 totals findings::close() {

@@ -28,8 +28,8 @@ public:
     /* Withdraws the warnings of a line, because an error explains it. */
     void retract(warning_id id, int line);
 
-    /* The error of a line, to be completed later; null if it has been passed on already. */
-    finding *waiting_error(message_id id, int line);
+    /* Completes the error of a line, unless it has been passed on already. */
+    void correct(message_id id, int line, const std::function<correction()> &fix);
 
     size_t errors() const {
         return count.errors;
@@ -49,14 +49,18 @@ private:
     void sort();
     void hand_over(entry &each);
     void make_room();
+    void pass_on_first_half();
 
     sink to;
     question may_retract;
     std::vector<entry> waiting;
-    size_t room = WAITING_MAX; /* entries for which make_room() has nothing to do */
+    size_t parts = 0;              /* their notes and edits, but for those of the latest */
+    size_t room = WAITING_MAX;     /* entries for which make_room() has nothing to do, */
+    size_t parts_room = PARTS_MAX; /* and their parts */
     totals count;
 
     static constexpr size_t WAITING_MAX = 1024; /* findings that can be passed on */
+    static constexpr size_t PARTS_MAX = 16384;
 };
 
 } // namespace check

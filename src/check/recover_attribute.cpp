@@ -64,8 +64,7 @@ void recovery::take_attribute() {
 /* Optional attributes that came too early are moved after the last required one. A line in pieces is not moved. */
 void recovery::settle_order() {
     if (compiler.is_complete(known.kind)) {
-        if (finding *error = found.waiting_error(MSG_OPTIONAL_TOO_EARLY, early.first_line()))
-            error->fix = early.after(line);
+        found.correct(MSG_OPTIONAL_TOO_EARLY, early.first_line(), [this] { return early.after(line); });
         return early.close();
     }
     const table_attrs *attr = attr_meant();

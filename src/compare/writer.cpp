@@ -26,7 +26,7 @@ void append_to(std::string &text, std::string_view piece) {
 
 } // namespace
 
-allowance::allowance(std::size_t size) : left(size * TIMES_SIZE + AT_LEAST) {}
+allowance::allowance(std::size_t size) : left(std::uint64_t{size} * TIMES_SIZE + AT_LEAST) {}
 
 void allowance::spend(std::size_t length) {
     if (length <= LINE)

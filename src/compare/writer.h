@@ -4,6 +4,7 @@
 
 #include "compare/node.h"
 
+#include <cstdint>
 #include <functional>
 #include <stdexcept>
 #include <string>
@@ -29,7 +30,7 @@ public:
     void spend(std::size_t length);
 
 private:
-    std::size_t left;
+    std::uint64_t left; /* on 32-bit machines too */
 };
 
 /* Writes values for people: 5, 0.1, 'text', 0x0102, [1, 2], {Int32 0}, nothing, misplaced 5. Its functions throw

@@ -15,7 +15,8 @@ namespace report {
 
 namespace {
 
-constexpr std::size_t PORTION = 65536; /* bytes that are written at once */
+constexpr std::size_t PORTION = 65536;    /* bytes that are written at once */
+constexpr std::size_t WAITING_MAX = 1024; /* findings */
 
 constexpr const char *BOLD = "\033[1m";
 constexpr const char *RED = "\033[1;31m";
@@ -64,7 +65,8 @@ private:
     bool coloured;
 };
 
-/* Warnings are kept until it is certain that they are shown, because a later error may take the place of one. */
+/* Warnings are kept until it is certain that they are shown, because a later error may take the place of one. To limit
+ * memory, a warning is shown once so many findings after it wait. */
 class text_writer : public writer {
 public:
     text_writer(output written_to, const text_settings &wanted) : to(std::move(written_to)), settings(wanted) {}
@@ -85,6 +87,7 @@ public:
         ++shown;
         waiting_warnings += found.error ? 0 : 1;
         waiting.push_back({file, found, {}});
+        waiting.back().found.fix = {}; /* which may be large, and is not shown */
         write_certain();
     }
     void end_source(const check::totals & /* count */) override {
@@ -125,7 +128,8 @@ private:
         --shown;
     }
     void write_certain() {
-        while (!waiting.empty() && (settings.shown_max == 0 || !is_warning(waiting.front()))) {
+        while (!waiting.empty() &&
+               (settings.shown_max == 0 || !is_warning(waiting.front()) || waiting.size() > WAITING_MAX)) {
             append(waiting.front());
             waiting.pop_front();
         }

@@ -1,6 +1,8 @@
 /* numbers.cpp: warnings about numbers whose stored value differs from the written one. */
 
 #include "check/numbers.h"
+#include "check/first_lines.h"
+#include "check/kept_lines.h"
 
 #include "check/warnings/watcher.h"
 
@@ -43,40 +45,49 @@ public:
     }
 };
 
-/* The Ids of attributes that do not fit the class's Locator, which is looked up at the end. */
+/* The Ids of attributes that do not fit the class's Locator, which is looked up at the end. There may be very many. */
 class wide_ids {
 public:
-    struct entry {
-        std::string name; /* of the attribute */
-        mention id;
-        vx_int64_t value = 0;
-    };
-
     void begin_class() {
-        all.clear();
+        positions.clear();
+        ids.clear();
     }
     void take_name(std::string_view text) {
-        current.name = text;
+        name = text;
     }
     void take_id(const view &see) {
         constexpr vx_int64_t HIGHEST = 0xFFFE; /* the next one means that there is no locator */
-        current.value = check::number(see.value(), 0).value;
-        if (current.value > HIGHEST)
-            current.id = see.value_mention();
+        if (check::number(see.value(), 0).value > HIGHEST)
+            id = see.value_mention();
     }
     void end_attribute() {
-        if (current.id.at.line != 0)
-            all.push_back(current);
-        current = {};
+        if (id.at.line != 0)
+            add();
+        id = {};
+        name.clear();
     }
-    const entry *of(std::string_view name) const {
-        auto found = std::find_if(all.begin(), all.end(), [&](const entry &each) { return each.name == name; });
-        return found == all.end() ? nullptr : &*found;
+    /* The first attribute's of this name. */
+    std::optional<mention> of(std::string_view wanted) const {
+        int position = positions.find(wanted);
+        if (position == 0)
+            return std::nullopt;
+        size_t at = static_cast<size_t>(position) - 1;
+        return mention{ids.at(at), std::string(ids.text_of(at)), std::string(ids.line_of(at))};
     }
 
 private:
-    entry current;
-    std::vector<entry> all;
+    void add() {
+        int &position = positions.line_of(name);
+        if (position != 0)
+            return;
+        ids.add(id.at, id.source);
+        position = static_cast<int>(ids.size());
+    }
+
+    std::string name; /* of the current attribute */
+    mention id;       /* its Id, if that is wide; line 0: it is not */
+    kept_lines ids;
+    first_lines positions; /* by names: where in `ids`, from 1 */
 };
 
 class narrowed : public watcher {
@@ -104,12 +115,13 @@ public:
     }
     void source_end(const view &) override {
         constexpr long BITS = 0xFFFF;
-        const wide_ids::entry *wide = locator ? ids.of(locator->text) : nullptr;
-        if (wide == nullptr)
+        std::optional<mention> wide = locator ? ids.of(locator->text) : std::nullopt;
+        if (!wide)
             return;
-        advise(report(wide->id.at, wide->id.source,
+        vx_int64_t stored = check::number(wide->text, 0).value & BITS;
+        advise(report(wide->at, wide->source,
                       "does not fit the 16 bits that the Locator has: it is stored as " +
-                          ((wide->value & BITS) == BITS ? "65535, none" : std::to_string(wide->value & BITS)),
+                          (stored == BITS ? "65535, none" : std::to_string(stored)),
                       {locator->at, "the `Locator`"}),
                "choose an Id of at most 65534");
     }

@@ -146,6 +146,36 @@ def test_fix(directory, name, options):
     assert (b" =" in after or b"\r" in after) == (len(options) == 2)
 
 
+@pytest.mark.slow(10)
+def test_many_shown(directory):
+    """However many findings are to be shown, few wait until it is certain that they are."""
+    head, line, _ = KEPT["same-valid-values"]
+    source = write_source(directory, head, line, 100_000)
+    status, _, messages = run_bounded(directory, [PROGRAMS.cdef, "check", "--max=100000"], source)
+    same(status, 1, "status")
+    same(messages.count(b": warning: "), 99_999, "warnings shown")
+
+
+@pytest.mark.slow(10)
+def test_many_edits(directory):
+    """Corrections of many edits do not wait as long as others: here, 60 that each move 4,096 lines."""
+    attribute = PERSISTENT.format("StringArray").replace("\n", "\n" + " DefaultValue=a\n" * 4096, 1)
+    source = write_source(directory, CLASS, attribute + " VarietyRange=1,9\n", 60)
+    options = ["--no-warn=all", "--format=json"]
+    status, out, _ = run_within(directory, BASE + 6 * MEGABYTES, [PROGRAMS.cdef, "check", *options], source)
+    same(status, 1, "status")
+    same(out.read_bytes().count(b'"certain"'), 60, "corrections")
+
+
+@pytest.mark.slow(10)
+def test_wide_ids(directory):
+    """Ids that a locator could not have are kept until the class has named its locator. Just after a table has grown, it
+    takes the most memory."""
+    source = write_source(directory, CLASS, "PersistentResourceAttribute\n Id=70000\n Name={:x}\n", (1 << 18) + 6)
+    bound = 8 * source.stat().st_size + 16 * MEGABYTES
+    assert peak_of([PROGRAMS.cdef, "check", "-q", "--max=1", source]) <= bound
+
+
 @pytest.mark.slow(30)
 @pytest.mark.parametrize("equals", ["=", " ="])
 def test_fix_of_variable_classes(directory, equals):

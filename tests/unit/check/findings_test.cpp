@@ -78,6 +78,37 @@ TEST_F(Findings, AreHandedOverBeforeTheEndIfThereAreMany) {
         EXPECT_EQ(given[i].at.line, static_cast<int>(i) + 1);
 }
 
+check::correction of_edits(size_t count) {
+    return {check::certainty::certain, std::vector<check::edit>(count)};
+}
+
+TEST_F(Findings, AreHandedOverIfTheirNotesAndEditsAreMany) {
+    found.error(message_of(MSG_NO_EQUALS), {1, 1, 1}, "source", "error").fix = of_edits(10'000);
+    error(2);
+    found.error(message_of(MSG_NO_EQUALS), {3, 1, 1}, "source", "error").notes.resize(6'383);
+    error(4);
+    EXPECT_EQ(given.size(), 0u); /* 16,383 of them wait */
+    found.error(message_of(MSG_NO_EQUALS), {5, 1, 1}, "source", "error").notes.resize(1);
+    EXPECT_EQ(given.size(), 0u);
+    error(6);
+    EXPECT_EQ(given.size(), 2u);
+    EXPECT_EQ(handed_over(), "S103 1, S103 2, S103 3, S103 4, S103 5, S103 6, ");
+}
+
+TEST_F(Findings, CountTheEditsOfALaterCorrection) {
+    error(1);
+    error(2);
+    found.correct(MSG_NO_EQUALS, 1, [] { return of_edits(16'384); });
+    error(3);
+    EXPECT_EQ(given.size(), 1u);
+    EXPECT_EQ(given.at(0).fix.edits.size(), 16'384u);
+    found.correct(MSG_NO_EQUALS, 1, [] { return of_edits(1); }); /* has been handed over */
+    found.correct(MSG_NO_EQUALS, 3, [] { return of_edits(2); });
+    found.close();
+    EXPECT_EQ(given.at(1).fix.edits.size(), 0u);
+    EXPECT_EQ(given.at(2).fix.edits.size(), 2u);
+}
+
 TEST_F(Findings, WaitForOnesOfEarlierLines) {
     for (int line = 1; line <= 10'000; ++line) {
         error(line);

@@ -89,6 +89,25 @@ TEST(TextForm, KeepsNothingWithoutALimit) {
     EXPECT_GT(to.text.size(), 300'000u);
 }
 
+/* A warning is certain once 1,024 findings wait after it. */
+TEST(TextForm, KeepsFewWhateverTheLimit) {
+    written to({.shown_max = 1'030});
+    for (int line = 1; line <= 1'030; ++line)
+        to.form->add(finding_at(false, line));
+    to.form->end_source({0, 1'030});
+    EXPECT_EQ(to.lines(), "f:1:1: warning: text 1\nf:2:1: warning: text 2\nf:3:1: warning: text 3\n"
+                          "f:4:1: warning: text 4\nf:5:1: warning: text 5\nf:6:1: warning: text 6\n");
+    for (int line = 1'031; line <= 2'060; ++line)
+        to.form->add(finding_at(true, line));
+    to.form->close();
+    std::string lines = to.lines();
+    EXPECT_EQ(std::count(lines.begin(), lines.end(), '\n'), 1'031);
+    EXPECT_NE(lines.find("f:6:1: warning: text 6\nf:1031:1: error: text 1031\n"), std::string::npos);
+    EXPECT_NE(lines.find("f:2054:1: error: text 2054\n"
+                         "1030 errors and 1030 warnings; 1030 not shown (--max 0 shows all)\n"),
+              std::string::npos);
+}
+
 TEST(TextForm, IsQuiet) {
     written to({.shown_max = 1, .quiet = true});
     to.form->add(finding_at(false, 1));

@@ -56,7 +56,8 @@ void settle_range(cdgen &cx, rsrc_dattr_t &attr) {
         mark_absent(attr.ra_min_value);
         mark_absent(attr.ra_max_value);
     } else if (!cx.range.dattr_range_found) {
-        cx.range.dattr_range_type = VX_UNKNOWN;
+        if (attr.ra_cb_ID == CDB_ID_DATTR)
+            cx.range.dattr_range_type = VX_UNKNOWN;
         default_bound(cx, &attr.ra_min_value, attr.ra_data_type, R_LO_DEFAULT, MSG_NO_LOWER_BOUND);
         default_bound(cx, &attr.ra_max_value, attr.ra_data_type, R_HI_DEFAULT, MSG_NO_UPPER_BOUND);
     }

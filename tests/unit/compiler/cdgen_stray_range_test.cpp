@@ -87,6 +87,20 @@ TEST_P(StrayRange, DoesNotTurnText) {
     }
 }
 
+/* It stays in the resource attribute while a later class attribute, which the last one completes, gets a default range
+ * of its own. */
+TEST_P(StrayRange, DoesNotTurnTextAfterAnotherClassAttribute) {
+    std::string source = HEAD + attribute("DynamicResourceAttribute", GetParam(), "") +
+                         attribute("DynamicClassAttribute", "Int32", "\tRange=8,16\n") +
+                         attribute("DynamicClassAttribute", "Int32", "") +
+                         attribute("DynamicClassAttribute", "Int32", "") + HEAD + TAIL;
+    std::string native = compiled(source, "-n"), turned = compiled(source, "-s");
+    EXPECT_EQ(count_of(turned, "ABCDEFGHIJKLMNOPQRSTUVWXYZ"), 2U);
+    size_t ra_min_value = 80 + 16 * 4 + sizeof(rsrc_class_t) + 3 * sizeof(rsrc_dattr_t) + 40;
+    EXPECT_EQ(word_at(native, ra_min_value), 8U);
+    EXPECT_EQ(turned.substr(ra_min_value, 4), turned_word(native, ra_min_value));
+}
+
 INSTANTIATE_TEST_SUITE_P(Types, StrayRange,
                          testing::Values("Binary", "StringArray", "BinaryArray", "SDArray", "RHArray"));
 

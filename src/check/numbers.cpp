@@ -70,6 +70,7 @@ bool number_part::is_plain() const {
     case number_form::INDEX: /* an index of more bits may be the first that an attribute cannot store */
         return check::is_plain(text, 16);
     case number_form::BITS32:
+    case number_form::ID:
     case number_form::INT32:
     case number_form::UINT32:
     case number_form::UINT64:
@@ -130,7 +131,7 @@ number_parts numbers_in(int attr_type, vx_data_type_t type, std::string_view val
         parts.add({value, 0, number_form::BITS16});
         break;
     case AT_ID:
-        parts.add({value, 0, number_form::BITS32});
+        parts.add({value, 0, number_form::ID});
         break;
     case AT_SD_INDEX:
         parts.add({value, 0, number_form::INDEX});

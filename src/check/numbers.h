@@ -48,6 +48,7 @@ bool is_numeric(vx_data_type_t type);
 enum class number_form {
     BITS16, /* any base */
     BITS32, /* any base */
+    ID,     /* any base, stored as signed */
     INT32,  /* decimal, as the following ones */
     UINT32,
     UINT64,

@@ -97,9 +97,9 @@ constexpr message table[] = {
      "Remove it: the value is built from the defaults of the elements' types. An element takes no `DefaultValue` "
      "either."},
     {MSG_INDEX_NOT_CONSECUTIVE, "S210", "ElementIndeces must be consecutive", FIRST, mark_kind::value, blame::source,
-     "An `ElementIndex` is not the next one of its run, or an element before it has none. Or an earlier "
+     "An `ElementIndex` is not the next one of its structure, or an element before it has none. Or an earlier "
      "number overflowed, after which the index 0 is refused: the note says where.",
-     "Count from 0 in each run; shorten the number that overflows."},
+     "Count from 0 in each structure; shorten the number that overflows."},
     {MSG_SD_IN_SD, "S211", "SD elements cannot be of SD type", FIRST, mark_kind::value, blame::source,
      "An element is of type `SD` or `SDArray`.",
      "Structured data cannot contain structured data: choose another type."},

@@ -46,7 +46,7 @@ std::unique_ptr<writer> gitlab_form(output to);
 std::unique_ptr<writer> github_form(output to);
 
 struct text_settings {
-    std::size_t shown_max = 0; /* the most findings shown, errors first; 0: all */
+    std::size_t shown_max = 0; /* the most findings shown, warnings being left out first; 0: all */
     bool quiet = false;        /* only errors are shown, without a summary */
     bool coloured = false;
 };

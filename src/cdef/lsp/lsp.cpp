@@ -110,7 +110,7 @@ int connection::serve() {
 
 void add_lsp(program &app) {
     auto options = std::make_shared<lsp_options>();
-    command made = app.add("lsp", "Helps editors, by the Language Server Protocol on standard input and output",
+    command made = app.add("lsp", "Helps editors: speaks the Language Server Protocol on standard input and output",
                            [options] { return connection(*options).serve(); });
     made.add_flag("--stdio", options->standard_streams, "Ignored: the server always uses standard input and output");
     made.add("--explanations", options->explanations, "Page that explains the codes, instead of the installed one")

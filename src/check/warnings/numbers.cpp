@@ -20,7 +20,15 @@ namespace {
 
 /* The bits of a form that takes any base; 0 for others. */
 int bits_of(number_form form) {
-    return form == number_form::BITS16 ? 16 : form == number_form::BITS32 ? 32 : 0;
+    switch (form) {
+    case number_form::BITS16:
+        return 16;
+    case number_form::BITS32:
+    case number_form::ID:
+        return 32;
+    default:
+        return 0;
+    }
 }
 
 place place_of(const view &see, const number_part &part) {
@@ -131,6 +139,8 @@ public:
         case number_form::BITS16:
         case number_form::BITS32:
             return look_at_bits(see, part, bits_of(part.form));
+        case number_form::ID:
+            return look_at_id(see, part);
         case number_form::INT32:
             return look_at_int32(see, part);
         case number_form::UINT32:
@@ -153,6 +163,13 @@ private:
             report(see, place_of(see, part),
                    "does not fit " + std::to_string(bits) + " bits: it is stored as " +
                        std::to_string(n.value & limit));
+    }
+
+    void look_at_id(const view &see, const number_part &part) {
+        check::number n(part.text, 0);
+        auto stored = static_cast<vx_int32_t>(n.value);
+        if (n.overflow || n.value != stored || stored < 0)
+            report(see, place_of(see, part), "an Id is 0 to 2147483647: it is stored as " + std::to_string(stored));
     }
 
     void look_at_int32(const view &see, const number_part &part) {

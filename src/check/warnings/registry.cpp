@@ -90,8 +90,9 @@ constexpr row rows[] = {
       "Rename one."},
      make_same_name},
     {{RANGE_ELSEWHERE, "S503", "range-elsewhere", "a Range does not take effect in its own attribute",
-      "A `Range` of a `DynamicClassAttribute` is stored in a `DynamicResourceAttribute` that is still "
-      "open. Or another dynamic attribute is completed after the `Range` line, but before the attribute to which the "
+      "A `Range` of a `DynamicClassAttribute` is stored in a `DynamicResourceAttribute` that has not "
+      "been completed yet. Or another dynamic attribute is completed after the `Range` line, but before the attribute "
+      "to which the "
       "line belongs. Then the `Range` may be lost, and the other attribute, if it has none, gets the range 0 to 0 "
       "instead of 0 to 100.",
       "Put dynamic class attributes before dynamic resource attributes, and give the last dynamic class attribute no "
@@ -204,14 +205,16 @@ constexpr row rows[] = {
       "Put another stanza after them, for example by moving the elements up."},
      make_sd_run_at_end},
     {{STRAY_RUN, "S518", "stray-run", "elements do not belong to what they follow",
-      "`ActionInSDDefinition` or `ActionOutSDDefinition` comes where no action is open. `PAttrSDDefinition` follows a "
+      "`ActionInSDDefinition` or `ActionOutSDDefinition` comes where there is no action before it that has not been "
+      "completed. `PAttrSDDefinition` follows a "
       "dynamic attribute, or `DAttrSDDefinition` a persistent one. Or elements of another kind directly follow "
       "those of an attribute, so that it is not defined what they belong to. Not reported if an error shows that a "
       "header is missing.",
       "Put elements after what they belong to, and another stanza between two structures."},
      make_stray_run},
     {{CUT_SHORT, "S514", "cut-short", "a second class ends an attribute before it is checked",
-      "A second `ControlDefinition` ends an open attribute as it is, without checks and defaults.",
+      "A second `ControlDefinition` ends an attribute that has not been completed, as it is, without checks and "
+      "defaults.",
       "Put each class in a file of its own."},
      make_cut_short},
     {{UNKNOWN_LOCATOR, "S504", "unknown-locator", "a Locator names no attribute",

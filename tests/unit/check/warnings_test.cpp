@@ -105,8 +105,10 @@ TEST(NumberText, IsReportedForTextAfterANumberAndForNone) {
 }
 
 TEST(Narrowed, IsReportedForWhatDoesNotFit) {
-    EXPECT_EQ(found_in(CLASS + persistent("A", "4294967295", "Int32")), codes());
-    EXPECT_EQ(found_in(CLASS + persistent("A", "4294967296", "Int32")), codes{"S508 20:5+10"});
+    EXPECT_EQ(found_in(CLASS + persistent("A", "2147483647", "Int32")), codes());
+    for (const char *id : {"2147483648", "4294967295", "4294967296", "9223372036854775808", "-1"})
+        EXPECT_EQ(found_in(CLASS + persistent("A", id, "Int32")),
+                  codes{"S508 20:5+" + std::to_string(std::string_view(id).size())});
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "Int32", "\tDefaultValue=2147483648\n")), codes{"S508 23:15+10"});
     EXPECT_EQ(found_in(CLASS + persistent("A", "0", "UInt64", "\tDefaultValue=-1\n")), codes{"S508 23:15+2"});
 }

@@ -3,13 +3,13 @@
 The limit is one of the address space, so that nothing depends on what else the machine does.
 """
 
-import os
 import resource
 import subprocess
+import sys
 
 import pytest
 
-from programs import PROGRAMS, runner
+from programs import PROGRAMS, TESTS, runner
 
 MEGABYTES = 1 << 20
 
@@ -31,13 +31,16 @@ def run_within(directory, bound, command, *inputs):
     return result.returncode, directory / "out", errors
 
 
-def peak_of(command):
-    """The most memory, in bytes, that a program has at any time, if that is more than the interpreter has. What it says is
-    not shown."""
+def require_own_memory():
+    """Skips the test if not all of the program's memory is its own."""
     if PROGRAMS.sanitizers or runner():
         pytest.skip("a sanitizer or an emulator takes memory of its own")
-    with subprocess.Popen(command, stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL) as process:
-        _, status, used = os.wait4(process.pid, 0)
-        process.returncode = os.waitstatus_to_exitcode(status)
-    assert process.returncode >= 0
-    return used.ru_maxrss * 1024
+
+
+def peak_of(directory, command, **options):
+    """A program's status, and the most memory that it has had, in bytes. What it says is not shown."""
+    require_own_memory()
+    note = directory / "peak"
+    small = [sys.executable, "-S", "-B", TESTS / "support/peak.py", note]
+    done = subprocess.run([*small, *command], stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL, check=False, **options)
+    return done.returncode, int(note.read_text(encoding="ascii"))

@@ -1,16 +1,12 @@
 """Test that a compilation takes at most 1.6 times the memory of the database: each staging table is given back as soon
-as it is in the image.
-
-The databases are so large that the interpreter, which the program is forked from, takes less memory.
-"""
+as it is in the image."""
 
 import itertools
-import os
-import subprocess
 
 import pytest
 
-from programs import PROGRAMS, environment, runner
+from bounded import peak_of, require_own_memory
+from programs import PROGRAMS, environment
 
 PROGRAM = 2 << 20  # bytes of the program itself and of what does not depend on the database
 HEAD = ("ControlDefinition\nResourceClass\n\tDescription=1\n\tDisplayName=2\n\tProperties=HasResources\n"
@@ -32,15 +28,12 @@ SOURCES = {
 @pytest.mark.parametrize("option", ["-n", "-s"])
 @pytest.mark.parametrize("what", SOURCES)
 def test_peak(directory, what, option):
-    if PROGRAMS.sanitizers or runner():
-        pytest.skip("a sanitizer or an emulator takes memory of its own")
+    require_own_memory()
     with (directory / "source").open("w") as source:
         source.writelines(SOURCES[what]())
         source.write(MAP)
-    with subprocess.Popen([PROGRAMS.cdgen, option, "source", "c.cdef"], cwd=directory, env=environment()) as process:
-        _, status, used = os.wait4(process.pid, 0)
-        process.returncode = os.waitstatus_to_exitcode(status)
-    assert process.returncode == 0
+    status, peak = peak_of(directory, [PROGRAMS.cdgen, option, "source", "c.cdef"], cwd=directory, env=environment())
+    assert status == 0
     size = (directory / "c.cdef").stat().st_size
     assert size > 64 << 20
-    assert used.ru_maxrss * 1024 <= 1.6 * size + PROGRAM
+    assert peak <= 1.6 * size + PROGRAM

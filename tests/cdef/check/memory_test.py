@@ -185,7 +185,7 @@ def test_fix_of_variable_classes(directory, equals):
     """Their names are kept in each round, whether there is something to correct or not."""
     require_own_memory()
     source = write_source(directory, "ControlDefinition\nResourceClass\n",
-                          f"ResourceVariableClass\n VariableClass{equals}{{}}\n", max(LINES, 250_000))
+                          f"ResourceVariableClass\n VariableClass{equals}{{}}\n", 60_000)
     bound = 8 * source.stat().st_size + 16 * MEGABYTES
     status, peak = peak_of(directory, [PROGRAMS.cdef, "check", "-q", "--max=1", "--fix", source])
     same(status, 1, "status")

@@ -26,7 +26,7 @@ from programs import EXAMPLES, PROGRAMS, TESTS, environment
 BATCH = 100
 GROUPS = 8
 COUNT = 20000  # sources that all groups make together
-SANITIZED_COUNT = 3000
+SANITIZED_COUNT = 1000
 MUTATIONS = 3  # of each source of generate_sources.py
 WORDS = [
     "0", "-1", "1,2", "2,1", "4294967296", "99999999999999999999", "010", "0x", "0xAb", "abc", "", '""', '"', '"a" b',

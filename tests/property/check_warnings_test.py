@@ -20,7 +20,7 @@ from programs import PROGRAMS
 
 GROUPS = 4
 COUNT = 2000  # sources that all groups have together
-SANITIZED_COUNT = 400
+SANITIZED_COUNT = 160
 BATCH = 100
 PERSISTENT = ("PersistentResourceAttribute", "PersistentClassAttribute")
 DYNAMIC = ("DynamicResourceAttribute", "DynamicClassAttribute")

@@ -19,7 +19,7 @@ from programs import PROGRAMS
 
 GROUPS = 4
 COUNT = 2000  # sources of all groups
-SANITIZED_COUNT = 400
+SANITIZED_COUNT = 160
 AMBIGUOUS = 0.03  # of the misspelled names
 
 ATTRIBUTE = "Name Description DisplayName Id DataType VarietyRange"

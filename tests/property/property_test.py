@@ -33,7 +33,7 @@ from programs import PROGRAMS
 
 GROUPS = 40
 CASES = 10000  # sources that all groups have together
-SANITIZED_CASES = 2000
+SANITIZED_CASES = 1000
 MUTATIONS = 2  # of each source
 CATALOGUED = 2000  # sources that have everything between them
 SAMPLE = 100  # one of so many is compiled by the program itself too

@@ -320,6 +320,24 @@ def test_output_is_a_full_device(world):
     cannot_create(world, "/dev/full", errno.ENOSPC)
 
 
+@pytest.mark.parametrize("number", ["EOPNOTSUPP", "ENOSYS", "ENOLCK", "EINVAL"])
+def test_output_where_nothing_can_be_locked(world, number):
+    """The file system has no locks: the database is made without."""
+    good = world.good()
+    world.write(OUT, BEFORE)
+    check(ended(traced(world, "flock", [f"flock:error={number}"])) == (0, b"", b""), "it fails")
+    check(b"INJECTED" in world.read(TRACE), "no lock was refused")
+    check(world.read() == good, "another database")
+
+
+def test_output_that_cannot_be_locked(world):
+    """The file system has locks, but locking fails: the output is unchanged."""
+    world.write(OUT, BEFORE)
+    message = b"Cannot create CDB file: " + of_errno(errno.EIO) + b"\n"
+    with world.left_alone():
+        check(ended(traced(world, "flock", ["flock:error=EIO"])) == (1, b"", message), "expected", message)
+
+
 def cannot_map(world, out):
     """Checks that an output is refused because it cannot be mapped."""
     result = world.run(SOURCE, out)

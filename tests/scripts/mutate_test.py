@@ -155,6 +155,17 @@ def test_verdict(tree, renewed, fails, result, commands):
     assert [name for name in renewed if (place / "build/test" / name).read_text() != "the same"] == []
 
 
+def test_quick_verdict(tree):
+    """Tests that take long are left out."""
+    place, failing, ran = tree
+    failing.update(["use_test", "memory_test"])
+    (place / "x.cpp").write_text("a == b;\n")
+    (mutant,) = MUTATE.mutants_of("x.cpp", "a == b;\n")
+    for quick, expected in ((True, ("survived", "")), (False, ("killed", "tests/x_test.py::test_it"))):
+        (place / "build/test/cdef").write_text("another one")
+        assert MUTATE.verdict(place, mutant, quick) == expected
+
+
 def test_renew(directory):
     """Files that are new, missing, or of another time or size; not those that are the same."""
     source, target = directory / "source", directory / "target"
@@ -180,7 +191,7 @@ from scripts import script
 mutate = script("mutate")
 tree = pathlib.Path(sys.argv[1])
 START = 'for i in 1 2; do setsid sleep 1000 & echo $! >> ids; done; sleep 1000 & echo $! >> ids; echo $$ >> ids; ' + sys.argv[2]
-def verdict(tree, mutant):
+def verdict(tree, mutant, quick):
     return "killed", str(mutate.run(START, tree, 1 if sys.argv[2].startswith("sleep") else 1000, 1)[0])
 mutate.verdict = verdict
 mutate.RESULTS = tree / "results.jsonl"

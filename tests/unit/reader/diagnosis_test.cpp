@@ -43,6 +43,7 @@ std::vector<std::byte> small() {
 constexpr std::size_t LENGTH = 0, CHECKSUM = 4, ANCHOR_OF_CLASS = 80, CLASS = 144;
 constexpr std::size_t STRINGS_OF_CLASS = CLASS + offsetof(rsrc_class_t, u_rc_strings);
 constexpr std::size_t VARIETY_LIST = 896;
+constexpr std::size_t ATTRIBUTE_TYPE = 472, ELEMENT_TYPE = 1048;
 
 } // namespace
 
@@ -115,6 +116,16 @@ TEST(diagnosis, warnings_of_a_careless_source_are_no_consequences) {
     std::memcpy(&class_record, image.data() + 112, sizeof class_record);
     put(image, 112, class_record + 1);
     EXPECT_EQ(diagnosis_of(image), (lines{"CDB301 112", "CDB104 4 <- 0", "CDB353 384"}));
+}
+
+/* Both numbers are types of data, of which verify only warns. The first one is careless: the checksum includes it. The
+ * second one is damaged, and the error that it makes is the checksum's. */
+TEST(diagnosis, a_damaged_word_need_not_explain_all_warnings) {
+    std::vector<std::byte> image = small();
+    put_right(image, ATTRIBUTE_TYPE, VX_SBS_PTR);
+    EXPECT_EQ(diagnosis_of(image), lines{"CDB351 472"});
+    put(image, ELEMENT_TYPE, VX_UNKNOWN);
+    EXPECT_EQ(diagnosis_of(image), (lines{"CDB108 1048", "CDB104 4 <- 0", "CDB351 1048 <- 0", "CDB351 472"}));
 }
 
 /* Two wrong words: no single one explains everything, so rules tell what follows. */

@@ -169,6 +169,13 @@ TEST(PlainFraction, AnyTextHasTheLibrarysOutcome) {
     }
 }
 
+/* These are smaller than the smallest normal number and are rounded to it, which the library reports. */
+TEST(PlainFraction, JustBelowTheNormalNumbersIsRefused) {
+    const outcome refused = {-1, "", ERANGE};
+    EXPECT_EQ(by_the_compiler<float>("1.1754943e-38", VX_FLOAT32), refused);
+    EXPECT_EQ(by_the_compiler<double>("2.2250738585072012e-308", VX_FLOAT64), refused);
+}
+
 TEST(PlainInteger, TakesASignAsTheLibraryDoes) {
     EXPECT_EQ(converted<vx_int64_t>("-5", VX_INT64), -5);
     EXPECT_EQ(converted<vx_int64_t>("-999999999999999999", VX_INT64), -999999999999999999);

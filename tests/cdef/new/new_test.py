@@ -45,6 +45,12 @@ def test_never_overwrites(world):
     check(world.read("Fan.cdefsrc") == b"mine" and not world.path("missing").exists(), "overwritten")
 
 
+def test_without_standard_input(world):
+    """The file then has the lowest number that a file can have."""
+    expect(world.inspect("new", "class", "Fan", preexec_fn=lambda: os.close(0)), 0)
+    check(b"\tName=Fan\n" in world.read("Fan.cdefsrc"), world.read("Fan.cdefsrc"))
+
+
 def test_leaves_no_part_of_a_source(world):
     """If the file cannot be written completely."""
     result = world.inspect("new", "class", "Fan",

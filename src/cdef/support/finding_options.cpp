@@ -68,7 +68,8 @@ void finding_options::fail_source(report::writer &to, const std::string &why) co
 void add_report_options(command &to, finding_options &options) {
     add_forms(to, options.form, {"text", "json", "sarif", "github", "gitlab"},
               "Form of the findings; text is written to standard error");
-    to.add_count("--max", options.text.shown_max, "Show at most N findings as text, leaving out warnings first; 0: all");
+    to.add_count("--max", options.text.shown_max,
+                 "Show at most N findings as text, leaving out warnings first; 0: all");
     to.add_flag("-q,--quiet", options.text.quiet, "Show errors only, without a summary, as text");
     add_colour(to, options.colour);
 }

@@ -174,12 +174,15 @@ def test_renew(directory):
             (place / name).parent.mkdir(parents=True, exist_ok=True)
             (place / name).write_text(f"{place.name}\n")
             os.utime(place / name, (1, 1))
+        (place / "link").symlink_to(place.name)
     os.utime(target / "changed", (2, 2))
+    os.utime(target / "link", (2, 2), follow_symlinks=False)
     MUTATE.renew(source, target)
     found = {path.relative_to(target).as_posix(): path.read_text() for path in target.rglob("*") if path.is_file()}
     # "same" is as long and as old in both places, so its text is still the other one.
     assert found == {"same": "target\n", "changed": "source\n", "missing": "source\n", "in/missing": "source\n"}
     assert (target / "changed").stat().st_mtime == 1
+    assert (target / "link").readlink() == pathlib.Path("source")
     assert not (target / "far").exists()
 
 

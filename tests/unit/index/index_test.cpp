@@ -95,20 +95,20 @@ std::vector<std::string> mentions_in(const std::string &source, std::string_view
     return found;
 }
 
-using places = std::vector<std::string>;
+using shown_places = std::vector<std::string>;
 
 TEST(Names, OfALocator) {
     EXPECT_EQ(mentions_in("ControlDefinition\nResourceClass\n\tLocator=A\n"
                           "PersistentClassAttribute\n\tName=A\nPersistentResourceAttribute\n\tName=A\n",
                           "A"),
-              (places{"1:3", "0:5*", "1:7*"}));
+              (shown_places{"1:3", "0:5*", "1:7*"}));
 }
 
 TEST(Names, OfExpressionsAreOfTheSameLevelFirst) {
     std::string source = "ControlDefinition\nDynamicClassAttribute\n\tName=A\nDynamicResourceAttribute\n\tName=A\n"
                          "\tExpression=\"A > B\"\n\tReArmExpression=A\n";
-    EXPECT_EQ(mentions_in(source, "A"), (places{"0:3*", "1:5*", "1:6", "1:7"}));
-    EXPECT_EQ(mentions_in(source, "B"), places{});
+    EXPECT_EQ(mentions_in(source, "A"), (shown_places{"0:3*", "1:5*", "1:6", "1:7"}));
+    EXPECT_EQ(mentions_in(source, "B"), shown_places{});
 }
 
 TEST(Names, OfElementsBelongToTheirRun) {
@@ -116,21 +116,21 @@ TEST(Names, OfElementsBelongToTheirRun) {
                          "DAttrSDDefinition\n\tElementName=E\nDAttrSDDefinition\n\tElementName=F\n"
                          "DynamicResourceAttribute\n\tName=B\n\tExpression=A.F > B.F\n"
                          "DAttrSDDefinition\n\tElementName=F\n";
-    EXPECT_EQ(mentions_in(source, "F"), (places{"2:8*", "2:11", "4:11", "4:13*"}));
+    EXPECT_EQ(mentions_in(source, "F"), (shown_places{"2:8*", "2:11", "4:11", "4:13*"}));
 }
 
 TEST(Names, OfVariableClassesAreShared) {
     EXPECT_EQ(mentions_in("ResourceVariableClass\n\tVariableClass=V\nDynamicResourceAttribute\n\tVariableClass=V\n"
                           "DynamicClassAttribute\n\tVariableClass=V\n",
                           "V"),
-              (places{"0:2*", "0:4", "0:6"}));
+              (shown_places{"0:2*", "0:4", "0:6"}));
 }
 
 TEST(Names, OfTwoClassesAreTwo) {
     EXPECT_EQ(mentions_in("ControlDefinition\nPersistentResourceAttribute\n\tName=A\n"
                           "ControlDefinition\nPersistentResourceAttribute\n\tName=A\n",
                           "A"),
-              (places{"0:3*", "1:6*"}));
+              (shown_places{"0:3*", "1:6*"}));
 }
 
 TEST(Quotes, ContainTheOffsetsBetweenThem) {

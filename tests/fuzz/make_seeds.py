@@ -40,15 +40,17 @@ def sources():
         yield generate_sources.source(seed)[0]
 
 
-def compile_source(command, directory, text, name):
-    """Writes the databases of a source if it compiles."""
-    source = directory / "text"
-    source.write_bytes(text)
-    for suffix, option in (("", []), ("-turned", ["-s"])):
-        out = directory / f"{name}{suffix}.cdef"
-        environment = {**os.environ, "VX_CDB_FORCE_EMPTY_TIMESTAMP": ""}
-        subprocess.run([*command, *option, source, out], env=environment, capture_output=True, check=False)
-    source.unlink()
+def compile_sources(command, directory, texts):
+    """Writes the databases of the sources that compile, in both byte orders, all in one process."""
+    for number, text in enumerate(texts):
+        (directory / f"{number}.cdefsrc").write_bytes(text)
+    jobs = [f"{number}.cdefsrc\t{number}.cdef\n-s\t{number}.cdefsrc\t{number}-turned.cdef\n" for number in range(len(texts))]
+    environment = {**os.environ, "VX_CDB_FORCE_EMPTY_TIMESTAMP": ""}
+    run = subprocess.run(command, cwd=directory, env=environment, input="".join(jobs).encode(), stdout=subprocess.PIPE, check=True)
+    if run.stdout.count(b"\n") != 2 * len(texts):
+        sys.exit("make_seeds.py: the compiler has not answered about each source")
+    for number in range(len(texts)):
+        (directory / f"{number}.cdefsrc").unlink()
 
 
 def write_cdef_seeds(directory):
@@ -132,7 +134,7 @@ def words(command):
 def main():
     """Writes all seeds and dictionaries."""
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--cdgen", type=pathlib.Path, required=True)
+    parser.add_argument("--compile-many", type=pathlib.Path, required=True)
     parser.add_argument("--list-names", type=pathlib.Path, required=True)
     parser.add_argument("--runner", default="", help="the words, separated by ;, that programs of another machine need")
     parser.add_argument("directory", type=pathlib.Path)
@@ -140,10 +142,10 @@ def main():
     runner = [word for word in options.runner.split(";") if word]
     for name in ("source", "image", "cdef", "lsp"):
         (options.directory / name).mkdir(parents=True, exist_ok=True)
-    for number, text in enumerate(sources()):
-        option = OPTIONS[number % len(OPTIONS)]
-        (options.directory / "source" / str(number)).write_bytes(bytes([option]) + text)
-        compile_source([*runner, options.cdgen.resolve()], options.directory / "image", text, number)
+    texts = list(sources())
+    for number, text in enumerate(texts):
+        (options.directory / "source" / str(number)).write_bytes(bytes([OPTIONS[number % len(OPTIONS)]]) + text)
+    compile_sources([*runner, options.compile_many.resolve()], options.directory / "image", texts)
     command = [sys.executable, "-B", TESTS / "support" / "make_images.py", "--out", options.directory / "image"]
     subprocess.run(command, check=True)
     write_cdef_seeds(options.directory)

@@ -95,7 +95,8 @@ class Reproducible(Case):
             (copy / name).parent.mkdir(parents=True, exist_ok=True)
             shutil.copy(PROJECT / name, copy / name)
         build = self.here / "b"
-        options = [f"-D{name}={PROGRAMS.cache[name]}" for name in ("CDGEN_TOGETHER", "CMAKE_CXX_FLAGS_RELEASE")]
+        names = ("CDGEN_LTO", "CDGEN_TOGETHER", "CMAKE_CXX_FLAGS_RELEASE")
+        options = [f"-D{name}={PROGRAMS.cache[name]}" for name in names]
         run("cmake", "--preset", "package", *options, "-S", copy, "-B", build, cwd=copy)
         run("cmake", "--build", build)
         for name in ("cdgen", "cdef", "src/reader/libcdb_view.a"):

@@ -4,28 +4,31 @@
 
 #include "compiler/cdgen_context.h"
 
-#include <bit>
-#include <functional>
+#include <algorithm>
 #include <optional>
 #include <string_view>
+#include <utility>
+#include <vector>
 
 namespace {
 
 constexpr size_t VARIABLE_IDS_AU = 64;
 
-/* Finds variable classes by name; if several have the same name, the first. */
+/* Finds variable classes by name; if several have the same name, the first. In order, because names can be chosen so
+ * that each of them has the same place in a table of hashes. */
 class class_index {
 public:
-    explicit class_index(std::span<rsrc_variable_class_t> all)
-        : classes(all), slots(std::bit_ceil(2 * all.size() + 1)) {
-        for (vx_uint32_t number = 1; number <= classes.size(); ++number)
-            if (is_named(classes[number - 1]))
-                enter(number);
+    explicit class_index(std::span<rsrc_variable_class_t> all) : classes(all) {
+        by_name.reserve(classes.size());
+        for (vx_uint32_t position = 0; position < classes.size(); ++position)
+            if (is_named(classes[position]))
+                by_name.push_back(position);
+        std::ranges::sort(by_name, {}, [this](vx_uint32_t position) { return std::pair(name_of(position), position); });
     }
 
     rsrc_variable_class_t *find(std::string_view name) const {
-        vx_uint32_t number = slots[slot_of(name)];
-        return number == 0 ? nullptr : &classes[number - 1];
+        auto found = std::ranges::lower_bound(by_name, name, {}, [this](vx_uint32_t at) { return name_of(at); });
+        return found == by_name.end() || name_of(*found) != name ? nullptr : &classes[*found];
     }
 
 private:
@@ -35,26 +38,13 @@ private:
         return strings != nullptr && strings->tbl_base != nullptr;
     }
 
-    std::string_view name_of(vx_uint32_t number) const {
-        const rsrc_variable_class_t &named = classes[number - 1];
+    std::string_view name_of(vx_uint32_t position) const {
+        const rsrc_variable_class_t &named = classes[position];
         return staged_content(named.u_rvc_string_tbl)->tbl_base + named.u_rvc_name.offset[0];
     }
 
-    /* The slot of the name, or the free slot where it may be entered. */
-    size_t slot_of(std::string_view name) const {
-        size_t slot = std::hash<std::string_view>()(name) % slots.size();
-        while (slots[slot] != 0 && name_of(slots[slot]) != name)
-            slot = (slot + 1) % slots.size();
-        return slot;
-    }
-
-    void enter(vx_uint32_t number) {
-        if (vx_uint32_t &slot = slots[slot_of(name_of(number))]; slot == 0)
-            slot = number;
-    }
-
     std::span<rsrc_variable_class_t> classes;
-    std::vector<vx_uint32_t> slots; /* positions of classes, counted from 1; at least half of them are free: 0 */
+    std::vector<vx_uint32_t> by_name;
 };
 
 /* Deliberately, a name that no variable class has is silently dropped. */

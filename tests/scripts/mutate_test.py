@@ -189,8 +189,9 @@ def test_renew(directory):
 # Tries a change in a lane. The test of the change starts processes, two of them in sessions of their own, and writes
 # down their ids.
 LANE = """
-import pathlib, sys
+import pathlib, signal, sys
 from scripts import script
+signal.signal(signal.SIGINT, signal.default_int_handler)  # what runs in the background may have been told to ignore it
 mutate = script("mutate")
 tree = pathlib.Path(sys.argv[1])
 START = 'for i in 1 2; do setsid sleep 1000 & echo $! >> ids; done; sleep 1000 & echo $! >> ids; echo $$ >> ids; ' + sys.argv[2]

@@ -27,7 +27,7 @@ from programs import PROGRAMS, TESTS, environment
 
 CASES = TESTS / "cdef" / "source"
 GENERATED_GROUPS = 6
-GENERATED_EACH = 50
+GENERATED_EACH, SANITIZED_EACH = 50, 10
 PARTS = 2  # that run side by side
 TIMEOUT = 60
 TROUBLE = 2
@@ -128,14 +128,15 @@ def check_generated(programs, group):
     """Checks the same of generated sources, most of which must compile."""
     problems = []
     compiled = 0
-    for seed in range(group * GENERATED_EACH, (group + 1) * GENERATED_EACH):
+    each = SANITIZED_EACH if PROGRAMS.sanitizers else GENERATED_EACH
+    for seed in range(group * each, (group + 1) * each):
         text = cdef_sources.source(seed)
         found = both_orders(programs, text)
         compiled += found is not None
         if found:
             problems += [f"seed {seed}: {line}" for line in found]
-    if compiled < GENERATED_EACH * 3 // 4:
-        problems.append(f"only {compiled} of {GENERATED_EACH} compile")
+    if compiled < each * 3 // 4:
+        problems.append(f"only {compiled} of {each} compile")
     return problems
 
 

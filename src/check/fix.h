@@ -13,7 +13,9 @@ namespace check {
 struct fixed_source {
     std::string text;
     size_t corrected = 0; /* corrections that were made */
-    size_t dropped = 0;   /* corrections that were not, because more errors would be found with them */
+    /* Corrections that were not, because more errors would be found with them, or with a group of corrections that they
+     * are in and that is too expensive to search. */
+    size_t dropped = 0;
 };
 
 /* Makes the certain corrections of the errors, and of the wanted warnings. The corrected text has no more errors than

@@ -124,4 +124,34 @@ TEST(Fix, DropsACorrectionThatBringsMoreErrors) {
     EXPECT_EQ(made.dropped, 1u);
 }
 
+/* With the right type, each of the three lines at the end of a stanza is an error. A good correction does not make up
+ * for two more errors. */
+std::string source_of_harmful_corrections(int count) {
+    std::string source = CLASS;
+    for (int i = 0; i < count; ++i) {
+        std::string number = std::to_string(i);
+        source += persistent("A" + number, number, "Int3", "\tDefaultValue=a\n\tDefaultValue=b\n\tDefaultValue=c\n");
+    }
+    return source;
+}
+
+TEST(Fix, FindsTheGoodCorrectionAmongManyHarmfulOnes) {
+    std::string source = source_of_harmful_corrections(30);
+    check::fixed_source made = fixed(source + persistent("B", "30", "Strnig"));
+    EXPECT_EQ(made.text, source + persistent("B", "30", "String"));
+    EXPECT_EQ(made.corrected, 1u);
+    EXPECT_EQ(made.dropped, 30u);
+}
+
+/* 200 checks would be needed. */
+TEST(Fix, ChecksALargeSourceAtMost64TimesToFindGoodCorrections) {
+    std::string source = source_of_harmful_corrections(100) + persistent("B", "100", "Strnig");
+    while (source.size() <= size_t{2} << 20)
+        source += "# " + std::string(100, '-') + "\n";
+    check::fixed_source made = fixed(source);
+    EXPECT_EQ(made.text, source);
+    EXPECT_EQ(made.corrected, 0u);
+    EXPECT_EQ(made.dropped, 101u);
+}
+
 } // namespace

@@ -3,10 +3,9 @@
 #include "text/unified_diff.h"
 
 #include <algorithm>
-#include <cstddef>
-#include <cstdint>
-#include <utility>
-#include <vector>
+#include <array>
+#include <optional>
+#include <string>
 
 namespace text {
 
@@ -15,149 +14,243 @@ namespace {
 constexpr std::size_t CONTEXT = 3; /* lines shown before and after a change */
 constexpr std::size_t WINDOW = 64; /* how many lines ahead to look for a line that both texts have */
 
-/* The lines of a text, with their newlines. There may be very many, so only 32 bits of each offset are kept. */
-class line_list {
+/* To limit memory: */
+constexpr std::size_t KEPT = 1024;   /* changes of a hunk that are kept until it is shown */
+constexpr std::size_t PIECE = 65536; /* bytes that are passed on together */
+
+/* Where a line begins, or the text's end. */
+struct place {
+    std::size_t line = 0; /* from 0 */
+    std::size_t byte = 0;
+};
+
+/* The lines of a text from a place on, with their newlines. There may be very many, so no more than WINDOW of them are
+ * known in advance. */
+class line_cursor {
 public:
-    explicit line_list(std::string_view whole) : text(whole) {
-        begins.reserve(static_cast<std::size_t>(std::count(text.begin(), text.end(), '\n')) + 1);
-        for (std::size_t begin = 0, next = 0; begin < text.size(); begin = next) {
-            while (carries.size() < std::uint64_t{begin} >> BITS)
-                carries.push_back(begins.size());
-            begins.push_back(static_cast<std::uint32_t>(begin));
-            next = std::min(text.find('\n', begin), text.size() - 1) + 1;
+    explicit line_cursor(std::string_view whole, place first = {}) : text(whole), here(first), known_to(first.byte) {}
+
+    place at() const {
+        return here;
+    }
+    bool is_at_end() const {
+        return here.byte == text.size();
+    }
+    /* So many lines after this one; empty if the text ends before. */
+    std::string_view line(std::size_t ahead = 0) {
+        for (; known <= ahead; ++known) {
+            std::size_t end = std::min(text.find('\n', known_to), text.size() - 1) + 1;
+            slot(known) = text.substr(known_to, end - known_to);
+            known_to = end;
+        }
+        return slot(ahead);
+    }
+    void advance(std::size_t lines = 1) {
+        for (; lines > 0; --lines) {
+            here = {here.line + 1, here.byte + line().size()};
+            first_known = (first_known + 1) % lines_known.size();
+            --known;
         }
     }
-
-    std::size_t size() const {
-        return begins.size();
-    }
-    /* Where a line begins; the text's end for the line after the last one. */
-    std::size_t begin_of(std::size_t line) const {
-        if (line == begins.size())
-            return text.size();
-        auto carried = std::upper_bound(carries.begin(), carries.end(), line) - carries.begin();
-        return static_cast<std::size_t>((static_cast<std::uint64_t>(carried) << BITS) + begins[line]);
-    }
-    std::string_view operator[](std::size_t line) const {
-        std::size_t begin = begin_of(line);
-        return text.substr(begin, begin_of(line + 1) - begin);
+    void advance_to_end() {
+        while (!is_at_end())
+            advance();
     }
 
 private:
-    static constexpr int BITS = 32;
+    std::string_view &slot(std::size_t ahead) {
+        return lines_known[(first_known + ahead) % lines_known.size()];
+    }
 
     std::string_view text;
-    std::vector<std::uint32_t> begins;
-    std::vector<std::size_t> carries; /* the first lines that begin at or after each multiple of 4 GiB */
+    place here;
+    std::size_t known_to; /* the byte after the lines that are known */
+    std::array<std::string_view, 2 * WINDOW> lines_known;
+    std::size_t first_known = 0;
+    std::size_t known = 0;
 };
 
-/* A range of lines in both texts; the end is the line after the last. */
 struct range {
-    std::size_t begin;
-    std::size_t end;
+    place begin;
+    place end; /* after the last line */
+
+    std::string_view of(std::string_view text) const {
+        return text.substr(begin.byte, end.byte - begin.byte);
+    }
 };
 struct change {
     range before;
     range after;
 };
 
-struct comparison {
-    line_list before;
-    line_list after;
+/* Finds the changes in order. */
+class comparison {
+public:
+    comparison(std::string_view text_before, std::string_view text_after) : before(text_before), after(text_after) {}
 
-    bool is_same(std::size_t i, std::size_t j) const {
-        return i < before.size() && j < after.size() && before[i] == after[j];
+    /* Those that follow a change. */
+    comparison(std::string_view text_before, std::string_view text_after, const change &last)
+        : before(text_before, last.before.end), after(text_after, last.after.end) {}
+
+    std::optional<change> next() {
+        for (; is_same(0, 0); after.advance())
+            before.advance();
+        change found = {{before.at(), {}}, {after.at(), {}}};
+        if (is_at_end())
+            return std::nullopt;
+        while (!is_at_end() && !is_same(0, 0))
+            pass_changed();
+        found.before.end = before.at();
+        found.after.end = after.at();
+        return found;
     }
-    /* How many lines of each text are changed here, where they differ. */
-    std::pair<std::size_t, std::size_t> changed(std::size_t i, std::size_t j) const {
-        if (i == before.size() || j == after.size())
-            return {before.size() - i, after.size() - j};
+
+private:
+    bool is_at_end() const {
+        return before.is_at_end() && after.is_at_end();
+    }
+    bool is_same(std::size_t i, std::size_t j) {
+        std::string_view line = before.line(i);
+        return !line.empty() && line == after.line(j);
+    }
+    /* Goes to the next line that both texts have, if it is near. */
+    void pass_changed() {
+        if (before.is_at_end() || after.is_at_end()) {
+            before.advance_to_end();
+            after.advance_to_end();
+            return;
+        }
         for (std::size_t lines = 1; lines <= WINDOW; ++lines)
             for (std::size_t removed = 0; removed <= lines; ++removed)
-                if (is_same(i + removed, j + lines - removed))
-                    return {removed, lines - removed};
-        return {1, 1};
+                if (is_same(removed, lines - removed)) {
+                    before.advance(removed);
+                    after.advance(lines - removed);
+                    return;
+                }
+        before.advance();
+        after.advance();
     }
-    std::vector<change> changes() const {
-        std::vector<change> all;
-        std::size_t i = 0;
-        std::size_t j = 0;
-        while (i < before.size() || j < after.size()) {
-            if (is_same(i, j)) {
-                ++i;
-                ++j;
-                continue;
-            }
-            auto [removed, added] = changed(i, j);
-            if (all.empty() || all.back().before.end < i)
-                all.push_back({{i, i}, {j, j}});
-            i = all.back().before.end = i + removed;
-            j = all.back().after.end = j + added;
-        }
-        return all;
-    }
+
+    line_cursor before;
+    line_cursor after;
 };
 
-void add_lines(std::string &to, char mark, const line_list &lines, range shown) {
-    for (std::size_t at = shown.begin; at < shown.end; ++at) {
-        to.append(1, mark).append(lines[at]);
-        if (!lines[at].ends_with('\n'))
-            to += "\n\\ No newline at end of file\n";
+/* Passes a text on in pieces. */
+class piecewise {
+public:
+    explicit piecewise(const piece_sink &sink) : to(sink) {}
+
+    void add(std::string_view text) {
+        if (piece.size() + text.size() > PIECE)
+            flush();
+        if (text.size() > PIECE)
+            to(text);
+        else
+            piece += text;
     }
-}
+    void add_lines(std::string_view mark, std::string_view lines) {
+        for (line_cursor at(lines); !at.is_at_end(); at.advance()) {
+            add(mark);
+            add(at.line());
+            if (!at.line().ends_with('\n'))
+                add("\n\\ No newline at end of file\n");
+        }
+    }
+    void flush() {
+        if (!piece.empty())
+            to(piece);
+        piece.clear();
+    }
+
+private:
+    const piece_sink &to;
+    std::string piece;
+};
 
 /* "12,3": the first line and how many; before an empty range, the line in front of it. */
-std::string shown(range lines) {
-    std::size_t count = lines.end - lines.begin;
-    std::string text = std::to_string(lines.begin + (count == 0 ? 0 : 1));
+std::string shown(std::size_t begin, std::size_t count) {
+    std::string text = std::to_string(begin + (count == 0 ? 0 : 1));
     return count == 1 ? text : text + "," + std::to_string(count);
 }
 
 /* Changes that share their context. */
-void add_hunk(std::string &to, const comparison &both, const change *first, const change *last) {
-    std::size_t context = std::min(CONTEXT, first->before.begin);
-    std::size_t rest = std::min(CONTEXT, both.before.size() - last->before.end);
-    range before = {first->before.begin - context, last->before.end + rest};
-    range after = {first->after.begin - context, last->after.end + rest};
-    to += "@@ -" + shown(before) + " +" + shown(after) + " @@\n";
-    std::size_t at = before.begin;
-    for (const change *each = first; each <= last; ++each) {
-        add_lines(to, ' ', both.before, {at, each->before.begin});
-        add_lines(to, '-', both.before, each->before);
-        add_lines(to, '+', both.after, each->after);
-        at = each->before.end;
+class hunk {
+public:
+    hunk(std::string_view text_before, std::string_view text_after, const change &one)
+        : before(text_before), after(text_after), first(one), last(one), kept({one}) {}
+
+    /* False if the next change is too far away. */
+    bool add(const change &next) {
+        if (next.before.begin.line - last.before.end.line > 2 * CONTEXT)
+            return false;
+        last = next;
+        if (kept.size() < KEPT)
+            kept.push_back(next);
+        return true;
     }
-    add_lines(to, ' ', both.before, {at, before.end});
-}
+    void show(piecewise &to) const {
+        std::size_t context = std::min(CONTEXT, first.before.begin.line);
+        std::size_t shown_to = first.before.begin.byte;
+        for (std::size_t line = 0; line < context; ++line)
+            shown_to = before.substr(0, shown_to - 1).rfind('\n') + 1;
+        line_cursor end(before, last.before.end);
+        while (!end.is_at_end() && end.at().line - last.before.end.line < CONTEXT)
+            end.advance();
+        std::size_t rest = end.at().line - last.before.end.line;
+        to.add("@@ -" + shown(first.before.begin.line - context, context + lines_of(&change::before) + rest));
+        to.add(" +" + shown(first.after.begin.line - context, context + lines_of(&change::after) + rest) + " @@\n");
+        show_changes(to, shown_to);
+        to.add_lines(" ", before.substr(last.before.end.byte, end.at().byte - last.before.end.byte));
+    }
+
+private:
+    std::size_t lines_of(range change::*side) const {
+        return (last.*side).end.line - (first.*side).begin.line;
+    }
+    void show_changes(piecewise &to, std::size_t shown_to) const {
+        auto show_change = [&](const change &each) {
+            to.add_lines(" ", before.substr(shown_to, each.before.begin.byte - shown_to));
+            to.add_lines("-", each.before.of(before));
+            to.add_lines("+", each.after.of(after));
+            shown_to = each.before.end.byte;
+        };
+        std::for_each(kept.begin(), kept.end(), show_change);
+        for (comparison again(before, after, kept.back()); shown_to < last.before.end.byte;)
+            show_change(*again.next());
+    }
+
+    std::string_view before;
+    std::string_view after;
+    change first;
+    change last;
+    std::vector<change> kept; /* the first of them */
+};
 
 } // namespace
 
 std::vector<line_change> changed_lines(std::string_view before, std::string_view after) {
-    comparison both = {line_list(before), line_list(after)};
+    comparison both(before, after);
     std::vector<line_change> all;
-    for (const change &each : both.changes()) {
-        std::size_t begin = both.after.begin_of(each.after.begin);
-        std::size_t end = both.after.begin_of(each.after.end);
-        all.push_back({both.before.begin_of(each.before.begin), both.before.begin_of(each.before.end),
-                       after.substr(begin, end - begin)});
-    }
+    while (std::optional<change> each = both.next())
+        all.push_back({each->before.begin.byte, each->before.end.byte, each->after.of(after)});
     return all;
 }
 
-std::string unified_diff(std::string_view old_name, std::string_view new_name, std::string_view before,
-                         std::string_view after) {
-    comparison both = {line_list(before), line_list(after)};
-    std::vector<change> changes = both.changes();
-    if (changes.empty())
-        return {};
-    std::string text = "--- " + std::string(old_name) + "\n+++ " + std::string(new_name) + "\n";
-    for (std::size_t first = 0, next = 0; first < changes.size(); first = next) {
-        next = first + 1;
-        while (next < changes.size() && changes[next].before.begin - changes[next - 1].before.end <= 2 * CONTEXT)
-            ++next;
-        add_hunk(text, both, &changes[first], &changes[next - 1]);
+void unified_diff(std::string_view old_name, std::string_view new_name, std::string_view before, std::string_view after,
+                  const piece_sink &to) {
+    if (before == after)
+        return;
+    piecewise pieces(to);
+    pieces.add("--- " + std::string(old_name) + "\n+++ " + std::string(new_name) + "\n");
+    comparison both(before, after);
+    for (std::optional<change> next = both.next(); next;) {
+        hunk one(before, after, *next);
+        do
+            next = both.next();
+        while (next && one.add(*next));
+        one.show(pieces);
     }
-    return text;
+    pieces.flush();
 }
 
 } // namespace text

@@ -3,7 +3,7 @@
 #define CDGEN_TEXT_UNIFIED_DIFF_H
 
 #include <cstddef>
-#include <string>
+#include <functional>
 #include <string_view>
 #include <vector>
 
@@ -16,13 +16,17 @@ struct line_change {
     std::string_view by; /* in the second text */
 };
 
-/* In order; there is at least one unchanged line between two of them. The same limits as below. */
+/* In order; there is at least one unchanged line between two of them. Takes time proportional to the number of lines.
+ * After large changes there may be more lines than necessary. */
 std::vector<line_change> changed_lines(std::string_view before, std::string_view after);
 
-/* Returns an empty text if nothing changed. Takes time proportional to the number of lines. After large changes it may
- * show more lines than necessary. */
-std::string unified_diff(std::string_view old_name, std::string_view new_name, std::string_view before,
-                         std::string_view after);
+/* Receives a text in pieces, which may end anywhere between two of the parts that it is made of: a mark, a line. */
+using piece_sink = std::function<void(std::string_view)>;
+
+/* Passes on nothing if nothing changed. Shows the changes above. They may be many and large, so only a part of the diff
+ * is in memory. */
+void unified_diff(std::string_view old_name, std::string_view new_name, std::string_view before, std::string_view after,
+                  const piece_sink &to);
 
 } // namespace text
 

@@ -43,7 +43,7 @@ std::string fix_source(const std::string &source, const check::warning_set &want
         std::string before = text_of_file(source);
         check::fixed_source fixed = check::fix_bytes(before, source, wanted);
         if (dry_run)
-            print(shown_diff(source, before, fixed.text));
+            show_diff(source, before, fixed.text);
         else if (source == "-")
             print(fixed.text);
         else if (fixed.text != before)

@@ -45,7 +45,7 @@ bool write(const std::string &source, const std::string &before, const std::stri
     if (options.checks)
         print(same ? "" : name_line(source));
     else if (options.diffs)
-        print(shown_diff(source, before, after));
+        show_diff(source, before, after);
     else if (!options.in_place || source == "-")
         print(after);
     else if (!same)

@@ -2,26 +2,28 @@
 
 #include "cdef/support/shown_diff.h"
 
+#include "cdef/support/output.h"
 #include "text/shown.h"
 #include "text/unified_diff.h"
 
-#include <cstddef>
 #include <unistd.h>
 
 namespace cdef {
 
 namespace {
 
-std::string for_output(std::string diff) {
-    if (isatty(STDOUT_FILENO) == 0)
-        return diff;
+void print_masked(std::string_view piece) {
     std::string shown;
-    for (std::size_t begin = 0; begin < diff.size();) {
-        std::size_t end = diff.find('\n', begin);
-        shown += text::masked(std::string_view(diff).substr(begin, end - begin)) + "\n";
-        begin = end + 1;
+    while (!piece.empty()) {
+        std::string_view line = piece.substr(0, piece.find('\n'));
+        piece.remove_prefix(line.size());
+        shown += text::masked(line);
+        if (!piece.empty()) {
+            shown += '\n';
+            piece.remove_prefix(1);
+        }
     }
-    return shown;
+    print(shown);
 }
 
 /* A name as patch(1) reads it: in quotes, if there are line breaks or tabs in it. */
@@ -31,12 +33,12 @@ std::string patch_name(const std::string &name) {
 
 } // namespace
 
-std::string shown_diff(const std::string &source, std::string_view before, std::string_view after) {
+void show_diff(const std::string &source, std::string_view before, std::string_view after) {
     std::string name = source == "-" ? "stdin" : source;
     bool absolute = name.starts_with('/');
     std::string old_name = patch_name((absolute ? "" : "a/") + name);
     std::string new_name = patch_name((absolute ? "" : "b/") + name);
-    return for_output(text::unified_diff(old_name, new_name, before, after));
+    text::unified_diff(old_name, new_name, before, after, isatty(STDOUT_FILENO) == 0 ? print : print_masked);
 }
 
 } // namespace cdef

@@ -7,10 +7,10 @@
 
 namespace cdef {
 
-/* The unified diff between two texts of a source, with file names as git writes them; empty if the texts are the same.
- * If standard output is a terminal, characters that could control it are replaced. Otherwise the diff is complete, so
- * that patch can use it. */
-std::string shown_diff(const std::string &source, std::string_view before, std::string_view after);
+/* Prints the unified diff between two texts of a source, with file names as git writes them; nothing if the texts are
+ * the same. If standard output is a terminal, characters that could control it are replaced. Otherwise the diff is
+ * complete, so that patch can use it. Throws failure if standard output cannot be written. */
+void show_diff(const std::string &source, std::string_view before, std::string_view after);
 
 } // namespace cdef
 

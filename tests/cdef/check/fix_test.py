@@ -1,8 +1,10 @@
 """Test `cdef check --fix`: which files it writes, and which it leaves alone. Unit tests show what it corrects."""
 
 import os
+import pty
 import stat
 import subprocess
+import tty
 
 import pytest
 
@@ -83,6 +85,19 @@ def test_dry_run(source):
     alone(source)
     subprocess.run(["patch", "-p1"], input=output.encode(), cwd=source.parent, check=True, capture_output=True)
     same(source.read_bytes(), SOUND, "patched source")
+
+
+def test_dry_run_on_a_terminal(source):
+    """What could control the terminal is replaced."""
+    source.write_bytes(b"# \x1b[31m \xc3\xa4 \xff\r\n" + WRONG)
+    master, slave = pty.openpty()
+    tty.setraw(slave)
+    with os.fdopen(master, "rb") as screen:
+        subprocess.run([PROGRAMS.cdef, "check", "-q", "--fix", "--dry-run", source.name], cwd=source.parent,
+                       stdout=slave, stderr=subprocess.DEVNULL, timeout=60, check=False)
+        shown = screen.read1()
+        os.close(slave)
+    same(shown.splitlines()[3:5], [b"-# ?[31m \xc3\xa4 ??", b"+# ?[31m \xc3\xa4 ?"], "changed lines")
 
 
 def test_standard_input(directory):

@@ -146,6 +146,24 @@ def test_fix(directory, name, options):
     assert (b" =" in after or b"\r" in after) == (len(options) == 2)
 
 
+DIFFS = {
+    "many-changes": ("ControlDefinition\r\n", "\r\n\n", 300_000),
+    "no-change": ("", "\n", 10_000_000),
+}
+
+
+@pytest.mark.slow(10)
+@pytest.mark.parametrize("name", DIFFS)
+def test_diff(directory, name):
+    """Neither the lines of a source nor its changes are kept to show them as a diff."""
+    require_own_memory()
+    source = write_source(directory, *DIFFS[name])
+    bound = 8 * source.stat().st_size + 16 * MEGABYTES
+    status, peak = peak_of(directory, [PROGRAMS.cdef, "check", "-q", "--max=1", "--fix", "--dry-run", source])
+    same(status, 1, "status")
+    assert peak <= bound
+
+
 @pytest.mark.slow(10)
 def test_many_shown(directory):
     """However many findings are to be shown, few wait until it is certain that they are."""

@@ -4,10 +4,16 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <string>
+#include <vector>
+
 namespace {
 
 std::string diff(std::string_view before, std::string_view after) {
-    return text::unified_diff("a", "b", before, after);
+    std::string whole;
+    text::unified_diff("a", "b", before, after, [&](std::string_view piece) { whole += piece; });
+    return whole;
 }
 
 TEST(UnifiedDiff, IsEmptyWithoutAChange) {
@@ -60,6 +66,38 @@ TEST(UnifiedDiff, TakesManyChangedLines) {
     std::string made = diff(before, after);
     EXPECT_TRUE(made.starts_with("--- a\n+++ b\n@@ -1,300 +1,300 @@\n-0\r\n-1\r\n"));
     EXPECT_TRUE(made.ends_with("+298\n+299\n"));
+}
+
+TEST(UnifiedDiff, ShowsManyChangesThatShareLines) {
+    std::string before;
+    std::string after;
+    std::string shown;
+    for (int i = 0; i < 3000; ++i) {
+        before += "a\nsame\n";
+        after += "b\nsame\n";
+        shown += "-a\n+b\n same\n";
+    }
+    EXPECT_EQ(diff(before, after), "--- a\n+++ b\n@@ -1,6000 +1,6000 @@\n" + shown);
+}
+
+TEST(UnifiedDiff, IsPassedOnInPieces) {
+    std::string lines;
+    for (int i = 0; i < 100000; ++i)
+        lines += "abcde\n";
+    std::size_t pieces = 0;
+    std::size_t largest = 0;
+    text::unified_diff("a", "b", "", lines, [&](std::string_view piece) {
+        ++pieces;
+        largest = std::max(largest, piece.size());
+    });
+    EXPECT_GE(pieces, 10u);
+    EXPECT_LE(largest, 65536u);
+}
+
+TEST(UnifiedDiff, TakesALineThatIsLongerThanAPiece) {
+    std::string line(100000, 'x');
+    EXPECT_EQ(diff("1\n", line + "\n2\n" + line),
+              "--- a\n+++ b\n@@ -1 +1,3 @@\n-1\n+" + line + "\n+2\n+" + line + "\n\\ No newline at end of file\n");
 }
 
 TEST(ChangedLines, AreWholeLinesOfBothTexts) {

@@ -54,8 +54,9 @@ struct noting {
         check::add(found.fix, see.line.renamed(given.at, given.source, language::type_meant_by(given.text, true)));
     }
     void suggest(std::string_view given, const language::name_list &names) {
-        add_here(suggestion(given, names));
-        replace(language::meant_by(given, names));
+        language::guess meant = language::meant_by(given, names);
+        add_here(suggestion(meant, names));
+        replace(meant);
     }
     void first_given(int line) {
         if (line != 0)

@@ -193,9 +193,11 @@ void recovery::unknown_header(const attr_text &text, const fatal_exit &failure) 
         return;
     if (front.size() < bare.size() && !is_header(front) && known.kind >= 0)
         return column_1_attribute(error, bare);
-    add(language::suggestion(bare, language::stanza_names()));
-    language::guess meant = language::meant_by(front, language::stanza_names());
-    if (front.size() == bare.size())
+    language::name_list names = language::stanza_names();
+    language::guess meant = language::meant_by(front, names);
+    bool is_name = front.size() == bare.size();
+    add(language::suggestion(is_name ? meant : language::meant_by(bare, names), names));
+    if (is_name)
         check::add(error.fix, line.renamed(line.part(bare), line.raw, meant));
     if (!meant.name().empty())
         return take_header(line.replaced(meant.name()), true);

@@ -45,7 +45,7 @@ inline constexpr std::string_view KNOWN_NAMES = "known are ";
  * or too many to read. */
 std::string suggestion(const guess &meant, const name_list &names);
 
-/* The same for a guess that has already been made. */
+/* The same for what a text was meant to be. */
 std::string suggestion(std::string_view text, const name_list &names);
 
 /* The data types that the compiler accepts for an attribute, or for an element. */

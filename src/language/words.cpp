@@ -12,7 +12,7 @@ namespace language {
 namespace {
 
 bool is_upper(char c) {
-    return std::isupper(static_cast<unsigned char>(c)) != 0;
+    return c >= 'A' && c <= 'Z';
 }
 
 bool starts_with(std::string_view word, std::string_view beginning) {
@@ -29,26 +29,35 @@ bool begins_word(std::string_view name, std::size_t at) {
     return is_upper(name[at]) && (!after_capital || before_small);
 }
 
+/* Removes the first word of a name, which is not empty. */
+std::string_view take_word(std::string_view &name) {
+    std::size_t end = 1;
+    while (end < name.size() && !begins_word(name, end))
+        ++end;
+    std::string_view word = name.substr(0, end);
+    name.remove_prefix(end);
+    return word;
+}
+
 } // namespace
 
 name_list words_of(std::string_view name) {
     name_list words;
-    std::size_t begin = 0;
-    for (std::size_t at = 1; at <= name.size(); ++at)
-        if (at == name.size() || begins_word(name, at)) {
-            words.push_back(name.substr(begin, at - begin));
-            begin = at;
-        }
+    while (!name.empty())
+        words.push_back(take_word(name));
     return words;
 }
 
+/* Makes no lists of words, because a source may have very many names. */
 bool is_part(std::string_view text, std::string_view name) {
-    name_list wanted = words_of(text);
-    std::size_t found = 0;
-    for (std::string_view word : words_of(name))
-        if (found < wanted.size() && starts_with(word, wanted[found]))
-            ++found;
-    return found == wanted.size();
+    while (!text.empty()) {
+        std::string_view wanted = take_word(text);
+        do {
+            if (name.empty())
+                return false;
+        } while (!starts_with(take_word(name), wanted));
+    }
+    return true;
 }
 
 name_list names_with_part(std::string_view text, const name_list &names) {

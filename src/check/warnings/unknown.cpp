@@ -30,8 +30,8 @@ std::string cure(std::string suggestion) {
 }
 
 /* Corrections of names that the source itself defines are never certain. */
-correction likely(const view &see, const mention &given, const language::name_list &names) {
-    correction fix = see.line.renamed(given.at, given.source, language::meant_by(given.text, names));
+correction likely(const view &see, const mention &given, const language::guess &meant) {
+    correction fix = see.line.renamed(given.at, given.source, meant);
     fix.sure = certainty::likely;
     return fix;
 }
@@ -59,8 +59,9 @@ public:
 private:
     void report_locator(const view &see, const language::name_list &names) {
         finding &found = report(locator->at, locator->source, "no `PersistentResourceAttribute` has this name");
-        advise(found, cure(language::suggestion(locator->text, names)));
-        found.fix = likely(see, *locator, names);
+        language::guess meant = language::meant_by(locator->text, names);
+        advise(found, cure(language::suggestion(meant, names)));
+        found.fix = likely(see, *locator, meant);
     }
 
     std::optional<mention> locator;
@@ -100,9 +101,10 @@ public:
             const mention each = {used.at(i), std::string(used.text_of(i)), std::string(used.line_of(i))};
             bool suggests = (compared += names.size()) <= COMPARED_MAX;
             finding &found = report(each.at, each.source, "no `ResourceVariableClass` has this name");
-            advise(found, cure(suggests ? language::suggestion(each.text, names) : std::string()));
+            language::guess meant = suggests ? language::meant_by(each.text, names) : language::guess();
+            advise(found, cure(suggests ? language::suggestion(meant, names) : std::string()));
             if (suggests)
-                found.fix = likely(see, each, names);
+                found.fix = likely(see, each, meant);
         }
     }
 

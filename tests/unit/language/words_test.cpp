@@ -25,6 +25,11 @@ TEST(IsPart, LeavesWordsOutAndCutsThemShort) {
     EXPECT_FALSE(is_part("TypeData", "DataType"));
     EXPECT_FALSE(is_part("DataTypes", "DataType"));
     EXPECT_FALSE(is_part("ata", "DataType"));
+    EXPECT_FALSE(is_part("DataType", "Data"));
+    EXPECT_TRUE(is_part("TypeType", "DataTypeIsType"));
+    EXPECT_FALSE(is_part("TypeType", "DataTypeIs"));
+    EXPECT_TRUE(is_part("", "Data"));
+    EXPECT_FALSE(is_part("Data", ""));
 }
 
 TEST(NamesWithPart, AreThoseOfThreeLettersOrMore) {

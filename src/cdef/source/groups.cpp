@@ -3,6 +3,8 @@
 #include "cdef/source/groups.h"
 
 #include "cdef/source/error.h"
+#include "language/limits.h"
+#include "language/messages.h"
 
 #include <unordered_map>
 #include <unordered_set>
@@ -186,6 +188,9 @@ std::optional<std::vector<std::optional<std::size_t>>> deal_out(const std::vecto
 void plan_variable_classes(class_plans &classes, const cdb::database &db) {
     std::vector<member> members = members_of(classes);
     std::vector<group> groups = groups_of(db);
+    if (groups.size() > VARIABLE_CLASSES_MAX)
+        no_source("database",
+                  std::string("its source would not compile: ") + message_of(MSG_TOO_MANY_VARIABLE_CLASSES).text);
     std::vector<var_id_t> ids(members.size());
     std::vector<std::vector<var_id_t>> lists(groups.size());
     std::transform(members.begin(), members.end(), ids.begin(), [](const member &m) { return m.id; });

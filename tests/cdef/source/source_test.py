@@ -21,6 +21,7 @@ import cdb_image
 import cdef_sources
 import golden
 import make_images
+from bounded import MEGABYTES, peak_of
 from compare import none, same
 from expectation import Expectation
 from programs import PROGRAMS, TESTS, environment
@@ -279,17 +280,29 @@ def dynamic_class(fields, of_class=()):
     return "\n".join([*lines, *(f'string "A{i}"' for i in range(len(marks))), "include tail.inc", ""])
 
 
-def check_choices_that_never_end(programs):
-    """Each ID is in two lists, and no choice completes the last list. The search ends nevertheless."""
-    ids = [*range(1, 31), *range(1, 31), 40, 41]
-    lists = [[number] for number in range(1, 31)] * 2 + [[41, 40]]
+def with_lists(ids, lists):
+    """A database with a dynamic attribute for each ID, and a variable class for each list of IDs."""
     text = dynamic_class([f"ra_attr_id={number}" for number in ids])
     for i, numbers in enumerate(lists):
         text += f"section varclass\nrsrc_variable_class_t:4 rvc_var_count={len(numbers)} u_rvc_string_tbl=8"
         text += f' u_rvc_compat_name=none\nstring "V{i}"\nvar_ids {" ".join(map(str, numbers))}\n'
+    return cdb_image.assemble(text, base_dir=TESTS / "golden")
+
+
+def check_choices_that_never_end(programs):
+    """Each ID is in two lists, and no choice completes the last list. The search ends nevertheless."""
+    ids = [*range(1, 31), *range(1, 31), 40, 41]
+    lists = [[number] for number in range(1, 31)] * 2 + [[41, 40]]
     why = "variable classes: their lists of IDs are not those that the dynamic attributes give"
-    database = cdb_image.assemble(text, base_dir=TESTS / "golden")
-    return refusals(programs, "choices", database, why)
+    return refusals(programs, "choices", with_lists(ids, lists), why)
+
+
+def check_too_many_lists(programs):
+    """The compiler fills no more than 100 lists, so nothing is said about how more of them are filled."""
+    why = "variable classes: their lists of IDs are not those that the dynamic attributes give"
+    most = refusals(programs, "100", with_lists([5], [[5]] * 100), why)
+    why = "database: its source would not compile: Too many variable classes with dynamic attributes (100 at most)"
+    return most + refusals(programs, "101", with_lists([5], [[5]] * 101), why)
 
 
 def check_too_many_mixtures(programs):
@@ -318,6 +331,19 @@ def programs():
 
 def test_choices_that_never_end(programs):
     none(check_choices_that_never_end(programs))
+
+
+def test_too_many_lists(programs):
+    none(check_too_many_lists(programs))
+
+
+def test_memory_for_too_many_lists(programs, directory):
+    """Where each attribute could be in each list, memory does not grow with the product of both."""
+    path = directory / DATABASE
+    path.write_bytes(with_lists([5] * 4000, [[5]] * 4000))
+    status, peak = peak_of(directory, [programs.cdef, "source", path])
+    assert status == TROUBLE
+    assert peak <= 8 * path.stat().st_size + 16 * MEGABYTES
 
 
 def test_too_many_mixtures(programs):

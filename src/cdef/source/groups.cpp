@@ -6,6 +6,9 @@
 #include "language/limits.h"
 #include "language/messages.h"
 
+#include <algorithm>
+#include <cstdint>
+#include <limits>
 #include <unordered_map>
 #include <unordered_set>
 
@@ -13,8 +16,11 @@ namespace cdef::source {
 
 namespace {
 
-/* The most steps of the search, which are repeated after each wrong choice. Careless sources need few choices. */
-constexpr std::size_t LOOKS_MAX = 20'000'000;
+/* How often the search may look at a member, on average: it looks again after a wrong choice. Careless sources need few
+ * choices. */
+constexpr std::size_t LOOKS_PER_MEMBER = 200;
+/* How many looks more it may take, so that few members can have many. */
+constexpr std::size_t LOOKS_MORE = 1'000'000;
 
 /* A dynamic attribute as a member of the lists. */
 struct member {
@@ -69,23 +75,31 @@ std::vector<group> groups_of(const cdb::database &db) {
 }
 
 /* Distributes members over lists. A member goes to the list whose next ID is the member's. Only if several lists
- * qualify is there a choice, which may turn out to be wrong later. */
+ * qualify is there a choice, which may turn out to be wrong later: when a member can go to no list, but every member
+ * with its ID is needed. */
 class dealer {
 public:
-    /* No list is empty. */
+    /* At most VARIABLE_CLASSES_MAX lists, none of which is empty. */
     dealer(const std::vector<var_id_t> &to_deal, const std::vector<std::vector<var_id_t>> &to) : members(to_deal) {
         owners.resize(members.size());
-        for (const std::vector<var_id_t> &ids : to)
+        for (const std::vector<var_id_t> &ids : to) {
+            for (var_id_t id : ids)
+                --listed[id].spare;
+            listed[ids[0]].waiting.push_back(static_cast<list_number>(lists.size()));
             lists.push_back({ids});
-        for (std::size_t i = 0; i < lists.size(); ++i)
-            waiting[lists[i].ids[0]].push_back(i);
+        }
+        for (var_id_t id : members)
+            if (auto found = listed.find(id); found != listed.end())
+                ++found->second.spare;
     }
 
     /* Returns false if no distribution was found. */
     bool deal() {
-        while (looks < LOOKS_MAX) {
-            deal_rest();
-            if (std::all_of(lists.begin(), lists.end(), [](const id_list &l) { return l.is_done(); }))
+        if (std::any_of(listed.begin(), listed.end(), [](const auto &each) { return each.second.spare < 0; }))
+            return false;
+        std::size_t looks_max = LOOKS_PER_MEMBER * members.size() + LOOKS_MORE;
+        while (looks < looks_max) {
+            if (deal_rest())
                 return true;
             if (!choose_otherwise())
                 return false;
@@ -99,41 +113,59 @@ public:
     }
 
 private:
+    /* A small type, because all lists may be candidates for each member. */
+    using list_number = std::uint8_t;
+    static_assert(VARIABLE_CLASSES_MAX <= std::numeric_limits<list_number>::max());
+
     /* A list, and how many of its IDs have been used. */
     struct id_list {
         const std::vector<var_id_t> &ids;
         std::size_t done = 0;
+    };
 
-        bool is_done() const {
-            return done == ids.size();
-        }
+    /* An ID that lists contain. */
+    struct listed_id {
+        std::vector<list_number> waiting; /* the lists whose next ID it is */
+        std::ptrdiff_t spare = 0;         /* how many of the next members with it need not go to a list */
     };
 
     struct choice {
         std::size_t member;
-        std::vector<std::size_t> candidates; /* lists; the last one is chosen */
+        std::size_t first; /* of its candidates; the last one is chosen */
     };
 
-    void deal_rest() {
+    /* Returns false at a member that can go to no list, but would have to. */
+    bool deal_rest() {
         for (; next < members.size(); ++next, ++looks) {
-            const std::vector<std::size_t> &candidates = waiting[members[next]];
-            if (candidates.empty())
+            auto found = listed.find(members[next]);
+            if (found == listed.end())
                 continue;
-            if (candidates.size() > 1)
-                choices.push_back({next, {candidates.rbegin(), candidates.rend()}});
-            give(next, candidates.front());
+            auto &[waiting, spare] = found->second;
+            if (waiting.empty()) {
+                if (spare == 0)
+                    return false;
+                --spare;
+                continue;
+            }
+            if (waiting.size() > 1) {
+                choices.push_back({next, candidates.size()});
+                candidates.insert(candidates.end(), waiting.rbegin(), waiting.rend());
+            }
+            give(next, waiting.front());
         }
+        return true;
     }
 
     /* Goes back to the latest choice that has another candidate. */
     bool choose_otherwise() {
         while (!choices.empty()) {
-            choice &latest = choices.back();
+            const choice &latest = choices.back();
             while (next > latest.member)
                 take_back(--next);
-            latest.candidates.pop_back();
-            if (!latest.candidates.empty()) {
-                give(next++, latest.candidates.back());
+            candidates.pop_back();
+            if (candidates.size() > latest.first) {
+                give(next++, candidates.back());
+                ++looks;
                 return true;
             }
             choices.pop_back();
@@ -141,7 +173,7 @@ private:
         return false;
     }
 
-    void give(std::size_t m, std::size_t list) {
+    void give(std::size_t m, list_number list) {
         stop_waiting(list);
         ++lists[list].done;
         wait(list);
@@ -149,30 +181,38 @@ private:
     }
 
     void take_back(std::size_t m) {
-        if (!owners[m])
-            return;
-        std::size_t list = *owners[m];
-        stop_waiting(list);
-        --lists[list].done;
-        wait(list);
-        owners[m].reset();
+        if (owners[m]) {
+            auto list = static_cast<list_number>(*owners[m]);
+            stop_waiting(list);
+            --lists[list].done;
+            wait(list);
+            owners[m].reset();
+        } else if (auto found = listed.find(members[m]); found != listed.end())
+            ++found->second.spare;
     }
 
-    void wait(std::size_t list) {
-        if (!lists[list].is_done())
-            waiting[lists[list].ids[lists[list].done]].push_back(list);
+    /* The lists that wait for the next ID of a list; null if it is complete. */
+    std::vector<list_number> *waiting_with(list_number list) {
+        const auto &[ids, done] = lists[list];
+        return done == ids.size() ? nullptr : &listed[ids[done]].waiting;
     }
 
-    void stop_waiting(std::size_t list) {
-        if (!lists[list].is_done())
-            std::erase(waiting[lists[list].ids[lists[list].done]], list);
+    void wait(list_number list) {
+        if (std::vector<list_number> *others = waiting_with(list))
+            others->push_back(list);
+    }
+
+    void stop_waiting(list_number list) {
+        if (std::vector<list_number> *others = waiting_with(list))
+            others->erase(std::find(others->begin(), others->end(), list));
     }
 
     const std::vector<var_id_t> &members;
     std::vector<id_list> lists;
-    std::vector<std::optional<std::size_t>> owners;                 /* lists by member */
-    std::unordered_map<var_id_t, std::vector<std::size_t>> waiting; /* lists by their next ID */
+    std::vector<std::optional<std::size_t>> owners; /* lists by member */
+    std::unordered_map<var_id_t, listed_id> listed;
     std::vector<choice> choices;
+    std::vector<list_number> candidates; /* of all choices */
     std::size_t looks = 0;
     std::size_t next = 0; /* member */
 };

@@ -5,6 +5,8 @@
 #include "compare/identity.h"
 #include "format/records.h"
 
+#include <utility>
+
 namespace compare {
 
 namespace {
@@ -145,30 +147,36 @@ void numbered_parts::collect() {
                      [](const entry &a, const entry &b) { return a.number < b.number; });
 }
 
-std::span<const numbered_parts::entry> numbered_parts::with(std::uint32_t number) {
+const numbered_parts::entry *numbered_parts::first_with(std::uint32_t number, std::uint8_t family) {
     if (!is_collected)
         collect();
-    auto first = std::lower_bound(entries.begin(), entries.end(), number,
-                                  [](const entry &e, std::uint32_t n) { return e.number < n; });
-    auto last =
-        std::upper_bound(first, entries.end(), number, [](std::uint32_t n, const entry &e) { return n < e.number; });
-    return {first, last};
+    std::pair wanted(number, family);
+    auto found = std::lower_bound(entries.begin(), entries.end(), wanted, [](const entry &e, const auto &other) {
+        return std::pair(e.number, e.family) < other;
+    });
+    bool is_there = found != entries.end() && std::pair(found->number, found->family) == wanted;
+    return is_there ? &*found : nullptr;
 }
 
 bool numbered_parts::has(node_kind kind, std::uint32_t number) {
-    auto found = with(number);
-    return std::any_of(found.begin(), found.end(),
-                       [&](const entry &e) { return parts.all[e.family].first.kind == kind; });
+    for (std::uint8_t f = 0; f < parts.count; ++f)
+        if (parts.all[f].first.kind == kind && first_with(number, f) != nullptr)
+            return true;
+    return false;
 }
 
 /* The first attribute that had the number decides. Class and resources have numbers of their own. */
 void numbered_parts::judge_stored(const node &after, breaches &found) {
     if (!is_attribute(after.kind))
         return;
-    for (const entry &e : with(number_of(after))) {
-        node before = parts.all[e.family].at(e.index);
-        if (!is_attribute(before.kind) || is_of_class(before.kind) != is_of_class(after.kind))
+    for (std::uint8_t f = 0; f < parts.count; ++f) {
+        node_kind kind = parts.all[f].first.kind;
+        if (!is_attribute(kind) || is_of_class(kind) != is_of_class(after.kind))
             continue;
+        const entry *first = first_with(number_of(after), f);
+        if (first == nullptr)
+            continue;
+        node before = parts.all[f].at(first->index);
         if (before.kind != after.kind)
             found.add(breach::STORED_KIND);
         if (data_type_of(before) != data_type_of(after))

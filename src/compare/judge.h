@@ -47,11 +47,12 @@ private:
     };
 
     void collect();
-    std::span<const entry> with(std::uint32_t number);
+    /* The first part of a family that has the number; null if there is none. */
+    const entry *first_with(std::uint32_t number, std::uint8_t family);
 
     const families &parts;
     bool is_collected = false;
-    std::vector<entry> entries; /* by number */
+    std::vector<entry> entries; /* by number; those of one number by family and index */
 };
 
 /* The field that holds the number of an attribute or an action; null for any other record. */

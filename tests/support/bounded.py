@@ -1,9 +1,10 @@
-"""Run a program with as much memory as its inputs allow: 8 times their size plus 16 MB.
+"""Run a program with as much memory as its inputs allow, 8 times their size plus 16 MB, or with limited processor time.
 
-The limit is one of the address space, so that nothing depends on what else the machine does.
+The limit of memory is one of the address space. So nothing depends on what else the machine does.
 """
 
 import resource
+import signal
 import subprocess
 import sys
 
@@ -44,3 +45,13 @@ def peak_of(directory, command, **options):
     small = [sys.executable, "-S", "-B", TESTS / "support/peak.py", note]
     done = subprocess.run([*small, *command], stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL, check=False, **options)
     return done.returncode, int(note.read_text(encoding="ascii"))
+
+
+def run_for(seconds, command, **options):
+    """A program's status, if it takes no more processor time than this, which is many times what it needs: only if the
+    time grows with the square of the input is it stopped. What it says is not shown."""
+    limit = (seconds, seconds + 1)
+    done = subprocess.run(command, stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL, check=False,
+                          preexec_fn=lambda: resource.setrlimit(resource.RLIMIT_CPU, limit), **options)
+    assert done.returncode != -signal.SIGXCPU, f"not done in {seconds} seconds"
+    return done.returncode

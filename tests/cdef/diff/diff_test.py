@@ -27,7 +27,7 @@ import pytest
 
 import cdb_image
 import make_images
-from bounded import MEGABYTES, run_bounded
+from bounded import MEGABYTES, run_bounded, run_for
 from compare import same
 from expectation import Expectation
 from programs import PROGRAMS, PROJECT, TESTS
@@ -591,6 +591,18 @@ def test_forged_databases_take_no_more_memory(programs, form):
         status, out, _ = run_bounded(programs.directory, [PROGRAMS.cdef, "diff", "--format", form], few, many)
         assert status in (1, 2)
         assert out.stat().st_size <= MEGABYTES + 16 * (few.stat().st_size + many.stat().st_size)
+
+
+def test_many_parts_may_have_one_number(programs):
+    """Not all parts with a number are looked at for each new part with it: those would be 25 thousand million."""
+    names = [f"A{i}" for i in range(65_000)]
+    actions = [f"{kind}\n\tName={name}\n\tDescription=3\n\tDisplayName=4\n\tId=1\n\tVarietyRange=1,1\n"
+               for kind in ("ClassAction", "ResourceAction") for name in names]
+    class_attributes, *attributes = [[attribute(name, 1, kind=kind) for name in names] for kind in (
+        "PersistentClassAttribute", "PersistentResourceAttribute", "DynamicResourceAttribute")]
+    one = programs.compile(class_source(*actions, *class_attributes, head="\tName=C\n"), "one.cdef")
+    two = programs.compile(class_source(*itertools.chain(*attributes), head="\tName=C\n"), "two.cdef")
+    same(run_for(30, [programs.cdef, "diff", one, two], cwd=programs.directory), 1, "status")
 
 
 def test_one_may_be_standard_input(programs):

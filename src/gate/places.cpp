@@ -6,6 +6,7 @@
 #include "compare/writer.h"
 
 #include <algorithm>
+#include <iterator>
 #include <vector>
 
 namespace gate {
@@ -32,6 +33,19 @@ std::span<const node *const> what_is_left(const compare::difference &d) {
     return d.what == compare::change::REMOVED ? d.path.first(d.path.size() - 1) : d.path;
 }
 
+/* A class without a ResourceClass has only the other one. */
+const stanza *first_class_of(const std::vector<stanza> &stanzas) {
+    for (int kind : {SC_RESOURCE_CLASS, SC_CONTROL_DEFINITION})
+        for (const stanza &each : stanzas)
+            if (each.kind == kind)
+                return &each;
+    return nullptr;
+}
+
+bool is_class(const stanza &one) {
+    return one.kind == SC_RESOURCE_CLASS || one.kind == SC_CONTROL_DEFINITION;
+}
+
 } // namespace
 
 int stanza_kind_of(node_kind kind) {
@@ -53,14 +67,44 @@ int stanza_kind_of(node_kind kind) {
     }
 }
 
+const source_places::tables &source_places::lookup() const {
+    if (made)
+        return *made;
+    tables &to = made.emplace(tables{.by_name = {}, .newlines = {}, .first_class = first_class_of(parts.stanzas)});
+    for (std::size_t i = 0; i < parts.stanzas.size(); ++i) {
+        const stanza &each = parts.stanzas[i];
+        to.by_name.push_back({each.kind, each.value(source, each.is_element() ? "ElementName" : "Name"), i});
+    }
+    std::sort(to.by_name.begin(), to.by_name.end());
+    for (std::size_t i = source.find('\n'); i != std::string_view::npos; i = source.find('\n', i + 1))
+        to.newlines.push_back(i);
+    return to;
+}
+
+/* from: a position in the index. */
+const stanza *source_places::first_called(int kind, std::string_view name, std::size_t from) const {
+    const std::vector<called_stanza> &all = lookup().by_name;
+    auto found = std::lower_bound(all.begin(), all.end(), called_stanza{kind, name, from});
+    bool is_called = found != all.end() && found->kind == kind && found->name == name;
+    return is_called ? &parts.stanzas[found->position] : nullptr;
+}
+
+std::size_t source_places::begin_of_class(int class_number) const {
+    auto first = std::partition_point(parts.stanzas.begin(), parts.stanzas.end(),
+                                      [=](const stanza &each) { return each.class_number < class_number; });
+    return static_cast<std::size_t>(first - parts.stanzas.begin());
+}
+
 located source_places::at(const source_index::span &part, std::size_t line) const {
     const source_index::span &whole = parts.lines[line].whole;
-    std::string_view before = source.substr(0, part.begin);
+    const std::vector<std::size_t> &newlines = lookup().newlines;
+    auto next = std::lower_bound(newlines.begin(), newlines.end(), part.begin);
+    std::size_t begin = next == newlines.begin() ? 0 : *std::prev(next) + 1; /* of the line in the file */
     check::place place = {.line = static_cast<int>(line) + 1,
                           .column = part.begin - whole.begin + 1,
                           .length = part.end - part.begin,
-                          .file_line = static_cast<int>(std::count(before.begin(), before.end(), '\n')) + 1,
-                          .file_column = before.size() - before.rfind('\n')};
+                          .file_line = static_cast<int>(next - newlines.begin()) + 1,
+                          .file_column = part.begin - begin + 1};
     return {place, std::string(whole.of(source))};
 }
 
@@ -68,45 +112,58 @@ located source_places::of_header(const stanza &of) const {
     return at(of.header, of.first_line);
 }
 
-/* names: of attributes; the first line that gives one of them. */
-located source_places::of_attribute(const stanza &in, std::string_view names) const {
-    for (const source_index::attribute &each : in.attributes)
-        if (each.known != nullptr && has_word(names, each.known->ta_name))
-            return at(each.parts.value.is_empty() ? each.parts.name : each.parts.value, each.line);
-    return of_header(in);
+/* names: of attributes; the first one in the stanza. Many differences may be about the same line. */
+const source_index::attribute *source_places::first_attribute(const stanza &in, std::string_view names) const {
+    auto [found, is_new] = attributes.try_emplace({&in, names}, nullptr);
+    if (!is_new)
+        return found->second;
+    auto first = std::find_if(in.attributes.begin(), in.attributes.end(), [names](const auto &each) {
+        return each.known != nullptr && has_word(names, each.known->ta_name);
+    });
+    if (first != in.attributes.end())
+        found->second = &*first;
+    return found->second;
 }
 
+located source_places::of_attribute(const stanza &in, std::string_view names) const {
+    const source_index::attribute *first = first_attribute(in, names);
+    if (first == nullptr)
+        return of_header(in);
+    return at(first->parts.value.is_empty() ? first->parts.name : first->parts.value, first->line);
+}
+
+/* class_number: 0 is any class. */
 const stanza *source_places::named(int kind, std::string_view name, int class_number) const {
-    for (const stanza &each : parts.stanzas)
-        if (each.kind == kind && each.value(source, "Name") == name &&
-            (class_number == 0 || each.class_number == class_number))
-            return &each;
-    return nullptr;
+    const stanza *found = first_called(kind, name, begin_of_class(class_number));
+    bool is_in_class = found != nullptr && (class_number == 0 || found->class_number == class_number);
+    return is_in_class ? found : nullptr;
 }
 
 /* A class without a name, or of another one, is the only one or the first one. */
 const stanza *source_places::class_stanza(std::string_view name) const {
-    if (const stanza *found = named(SC_RESOURCE_CLASS, name, 0))
-        return found;
-    for (int kind : {SC_RESOURCE_CLASS, SC_CONTROL_DEFINITION})
-        for (const stanza &each : parts.stanzas)
-            if (each.kind == kind)
-                return &each;
-    return nullptr;
+    const stanza *found = named(SC_RESOURCE_CLASS, name, 0);
+    return found != nullptr ? found : lookup().first_class;
 }
 
-/* owner: the stanza of an attribute or action; that of a class owns its inputs. */
+/* owner: the stanza of an attribute or action, which its elements follow; that of a class owns its inputs. */
 const stanza *source_places::element(const node &part, const stanza *owner) const {
     std::string_view name = compare::identity_of(part).name;
-    bool is_input = owner->kind == SC_RESOURCE_CLASS || owner->kind == SC_CONTROL_DEFINITION;
-    for (const stanza &each : parts.stanzas) {
-        bool is_owned = is_input ? each.class_number == owner->class_number
-                                 : each.owner != source_index::NONE && &parts.stanzas[each.owner] == owner;
-        if (each.is_element() && is_owned && has_word(part.field->lines, each.row().sc_name) &&
-            each.value(source, "ElementName") == name)
-            return &each;
+    bool is_input = is_class(*owner);
+    std::size_t from =
+        is_input ? begin_of_class(owner->class_number) : static_cast<std::size_t>(owner - parts.stanzas.data());
+    const stanza *first = owner;
+    for (int kind = 0; kind < SC_COUNT; ++kind) {
+        const srtable_ctrl &row = sc_tables[static_cast<std::size_t>(kind)];
+        if (row.sc_sd_owner == nullptr || !has_word(part.field->lines, row.sc_name))
+            continue;
+        const stanza *found = first_called(kind, name, from);
+        if (found == nullptr)
+            continue;
+        bool is_owned = is_input ? found->class_number == owner->class_number : found->owner == from;
+        if (is_owned && (first == owner || found < first))
+            first = found;
     }
-    return owner;
+    return first;
 }
 
 /* The stanza of the deepest part that has one. path: from the database. */

@@ -18,8 +18,11 @@ std::size_t owner_of_run(const std::vector<stanza> &before, const srtable_ctrl &
     bool of_action = kind.sc_sd_owner->of_action != nullptr;
     for (std::size_t at = before.size(); at-- > 0 && (of_attribute || of_action);) {
         const stanza &earlier = before[at];
-        if (earlier.is_element() && of_action)
+        if (earlier.is_element() && of_action) {
+            if (earlier.row().sc_sd_owner->of_action != nullptr) /* both follow the same action, if any */
+                return earlier.owner;
             continue;
+        }
         bool is_attribute = earlier.is_known() && earlier.row().sc_attr != nullptr;
         bool is_action = earlier.kind == SC_CLASS_ACTION || earlier.kind == SC_RESOURCE_ACTION;
         return (of_attribute ? is_attribute : is_action) ? at : NONE;

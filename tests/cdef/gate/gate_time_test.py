@@ -37,3 +37,12 @@ def test_many_findings(world, what):
     write(world, SOURCE, with_many(what, True))
     command = [PROGRAMS.cdef, "gate", "--no-config", "-q", "--level=stored", "--against=old.cdefsrc", SOURCE]
     check(run_for(30, command, cwd=world.path(".")) == 1, "no findings")
+
+
+def test_many_runs_of_one_action(world):
+    """Runs of input and output that replace each other. Not all those before are read to see whose the next one is."""
+    runs = (element("E", 0) + element("E", 0, "ActionOut")) * 200_000
+    write(world, SOURCE, with_class(THE_ACTION, runs))
+    write(world, "ids.lock", "")
+    command = [PROGRAMS.cdef, "gate", "--no-config", "-q", "--ids=ids.lock", SOURCE]
+    check(run_for(30, command, cwd=world.path(".")) == 0, "findings")

@@ -180,6 +180,23 @@ TEST(Numbers, MayBeLarge) {
     EXPECT_EQ(free_and_next("4294967301", "5"), (result{false, 6})); /* 5 and 2 to the power of 32 */
 }
 
+std::vector<std::size_t> owners_in(std::string_view source) {
+    std::vector<std::size_t> owners;
+    for (const source_index::stanza &each : source_index::index_of(source).stanzas)
+        owners.push_back(each.owner);
+    return owners;
+}
+
+/* Runs of an action follow it, whatever runs are between; those of an attribute follow it at once. */
+TEST(Runs, HaveOwners) {
+    constexpr std::size_t NONE = source_index::NONE;
+    EXPECT_EQ(owners_in("ControlDefinition\nResourceAction\nActionInSDDefinition\nActionOutSDDefinition\n"
+                        "PAttrSDDefinition\nActionInSDDefinition\nClassAction\nActionOutSDDefinition\n"
+                        "ActionInSDDefinition\nPersistentResourceAttribute\nPAttrSDDefinition\n"
+                        "ActionInSDDefinition\nActionOutSDDefinition\n"),
+              (std::vector<std::size_t>{NONE, NONE, 1, 1, NONE, 1, NONE, 6, 6, NONE, 9, NONE, NONE}));
+}
+
 TEST(Numbers, OfElementsCountInTheirRun) {
     std::string source = "ControlDefinition\nResourceAction\nActionInSDDefinition\n\tElementIndex=0\n"
                          "ActionInSDDefinition\nActionOutSDDefinition\n";

@@ -3,67 +3,76 @@
 #include "check/first_lines.h"
 
 #include <algorithm>
-#include <utility>
 
 namespace check {
 
-size_t first_lines::slot_of(std::string_view text, unsigned tag) const {
-    size_t mask = slots.size() - 1;
-    size_t at = tag & mask;
-    for (; slots[at].position != 0; at = (at + 1) & mask)
-        if (slots[at].tag == tag && text_of(slots[at].position) == text)
+size_t first_lines::slot_of(std::string_view text, unsigned hash) const {
+    mark wanted = mark_of(hash);
+    size_t at = home_of(hash);
+    for (; marks[at] != 0; at = after(at))
+        if (marks[at] == wanted && texts[positions[at]] == text)
             break;
     return at;
 }
 
+/* To need little memory, it frees the old slots first, and if they are many, makes only half as many more. */
 void first_lines::grow() {
-    std::vector<slot> old(std::max(FEWEST_SLOTS, 2 * slots.size()), slot{0, 0});
-    std::swap(old, slots);
-    size_t mask = slots.size() - 1;
-    for (const slot &each : old) {
-        size_t at = each.tag & mask;
-        while (each.position != 0 && slots[at].position != 0)
-            at = (at + 1) & mask;
-        if (each.position != 0)
-            slots[at] = each;
+    size_t more = marks.size() < MANY_SLOTS ? marks.size() : marks.size() / 2;
+    size_t wanted = std::max(FEWEST_SLOTS, marks.size() + more);
+    marks = std::vector<mark>();
+    positions = std::vector<unsigned>();
+    marks.resize(wanted);
+    positions.resize(wanted);
+    for (size_t i = 0; i < texts.size(); ++i) {
+        unsigned hash = hash_of(texts[i]);
+        size_t at = home_of(hash);
+        while (marks[at] != 0)
+            at = after(at);
+        marks[at] = mark_of(hash);
+        positions[at] = static_cast<unsigned>(i);
     }
 }
 
-int &first_lines::line_of(std::string_view text, unsigned tag) {
-    if (2 * entries.size() >= slots.size())
+int &first_lines::line_of(std::string_view text) {
+    if (4 * texts.size() >= 3 * marks.size())
         grow();
-    slot &found = slots[slot_of(text, tag)];
-    if (found.position == 0) {
-        entries.push_back({texts.size(), 0});
-        texts += text;
-        found = {tag, static_cast<unsigned>(entries.size())};
+    unsigned hash = hash_of(text);
+    size_t at = slot_of(text, hash);
+    if (marks[at] == 0) {
+        texts.add(text);
+        lines.push_back(0);
+        positions[at] = static_cast<unsigned>(texts.size() - 1);
+        marks[at] = mark_of(hash);
     }
-    return entries[found.position - 1].line;
+    return lines[positions[at]];
 }
 
-int first_lines::find(std::string_view text, unsigned tag) const {
-    size_t position = slots.empty() ? 0 : slots[slot_of(text, tag)].position;
-    return position == 0 ? 0 : entries[position - 1].line;
+int first_lines::find(std::string_view text) const {
+    if (marks.empty())
+        return 0;
+    size_t at = slot_of(text, hash_of(text));
+    return marks[at] == 0 ? 0 : lines[positions[at]];
 }
 
 std::vector<std::string_view> first_lines::all() const {
     std::vector<std::string_view> names;
-    names.reserve(entries.size());
-    for (size_t position = 1; position <= entries.size(); ++position)
-        names.push_back(text_of(position));
+    names.reserve(texts.size());
+    for (size_t i = 0; i < texts.size(); ++i)
+        names.push_back(texts[i]);
     return names;
 }
 
 /* The time that this takes is proportional to the texts, not to the most that there ever were. */
 void first_lines::clear() {
-    if (entries.empty())
+    if (texts.size() == 0)
         return;
-    bool sparse = slots.size() > FEWEST_SLOTS * entries.size();
-    slots.assign(sparse ? 0 : slots.size(), slot{0, 0});
-    if (sparse)
-        slots.shrink_to_fit();
+    if (marks.size() > FEWEST_SLOTS * texts.size()) {
+        marks = std::vector<mark>();
+        positions = std::vector<unsigned>();
+    }
+    std::fill(marks.begin(), marks.end(), mark{0});
     texts.clear();
-    entries.clear();
+    lines.clear();
 }
 
 } // namespace check

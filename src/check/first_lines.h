@@ -2,10 +2,12 @@
 #ifndef CDGEN_CHECK_FIRST_LINES_H
 #define CDGEN_CHECK_FIRST_LINES_H
 
+#include "check/packed_texts.h"
+
 #include <cstddef>
+#include <cstdint>
 #include <functional>
 #include <limits>
-#include <string>
 #include <string_view>
 #include <vector>
 
@@ -13,16 +15,15 @@ namespace check {
 
 class first_lines {
 public:
-    /* The line for a text, which the caller may set; 0 if the text is new. */
-    int &line_of(std::string_view text) {
-        return line_of(text, tag_of(text));
-    }
+    /* The line for a text, which is a part of a line of the source. The caller may set it; 0 if the text is new. */
+    int &line_of(std::string_view text);
     bool has(std::string_view text) const {
         return find(text) != 0;
     }
     /* The line of a text; 0 if it is not known. */
-    int find(std::string_view text) const {
-        return find(text, tag_of(text));
+    int find(std::string_view text) const;
+    size_t size() const {
+        return lines.size();
     }
     /* All texts, in the order in which they came; valid until the next one is added. */
     std::vector<std::string_view> all() const;
@@ -30,34 +31,36 @@ public:
 
 private:
     static constexpr size_t FEWEST_SLOTS = 64;
+    static constexpr size_t MANY_SLOTS = 1 << 16;
 
-    struct entry {
-        size_t begin; /* in texts; it ends where the next one begins */
-        int line;
-    };
-    struct slot {
-        unsigned tag;      /* a hash: gives the place of the slot, and shows without a comparison that most other texts
-                            * differ */
-        unsigned position; /* in entries, from 1; 0 is free */
-    };
+    /* What a slot shows of its text, so that most other texts need not be compared; 0 is a free slot. */
+    using mark = unsigned char;
 
     /* The highest 32 bits of the hash; on a 32-bit machine, all of it. */
-    static unsigned tag_of(std::string_view text) {
+    static unsigned hash_of(std::string_view text) {
         constexpr int LOWER = std::numeric_limits<size_t>::digits - std::numeric_limits<unsigned>::digits;
         return static_cast<unsigned>(std::hash<std::string_view>()(text) >> LOWER);
     }
-    int &line_of(std::string_view text, unsigned tag);
-    int find(std::string_view text, unsigned tag) const;
-    size_t slot_of(std::string_view text, unsigned tag) const;
-    void grow();
-    std::string_view text_of(size_t position) const {
-        size_t end = position < entries.size() ? entries[position].begin : texts.size();
-        return std::string_view(texts).substr(0, end).substr(entries[position - 1].begin);
+    /* The lowest bits of the hash: the highest ones give the slot. */
+    static mark mark_of(unsigned hash) {
+        return static_cast<mark>(1 + hash % std::numeric_limits<mark>::max());
     }
+    /* The slot where the search for a text begins. */
+    size_t home_of(unsigned hash) const {
+        return static_cast<size_t>((std::uint64_t{hash} * marks.size()) >> std::numeric_limits<unsigned>::digits);
+    }
+    size_t after(size_t at) const {
+        return at + 1 < marks.size() ? at + 1 : 0;
+    }
+    size_t slot_of(std::string_view text, unsigned hash) const;
+    void grow();
 
-    std::string texts;
-    std::vector<entry> entries;
-    std::vector<slot> slots;
+    packed_texts texts;
+    std::vector<int> lines; /* of each text */
+
+    /* Slots, of which at most three quarters are taken. */
+    std::vector<mark> marks;
+    std::vector<unsigned> positions; /* in texts */
 };
 
 } // namespace check

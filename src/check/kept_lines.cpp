@@ -5,8 +5,8 @@
 namespace check {
 
 void kept_lines::add(const place &at, std::string_view source) {
-    entries.push_back({texts.size(), at.line, static_cast<small>(at.column), static_cast<small>(at.length)});
-    texts += source;
+    entries.push_back({at.line, static_cast<small>(at.column), static_cast<small>(at.length)});
+    texts.add(source);
 }
 
 void kept_lines::clear() {

@@ -3,11 +3,11 @@
 #define CDGEN_CHECK_KEPT_LINES_H
 
 #include "check/check.h"
+#include "check/packed_texts.h"
 #include "language/limits.h"
 
 #include <cstddef>
 #include <limits>
-#include <string>
 #include <string_view>
 #include <vector>
 
@@ -27,8 +27,7 @@ public:
         return {each.line, each.column, each.length};
     }
     std::string_view line_of(size_t position) const {
-        size_t end = position + 1 < entries.size() ? entries[position + 1].begin : texts.size();
-        return std::string_view(texts).substr(0, end).substr(entries[position].begin);
+        return texts[position];
     }
     /* The part. */
     std::string_view text_of(size_t position) const {
@@ -40,13 +39,12 @@ private:
     static_assert(LINE_MAX_CHARS <= std::numeric_limits<small>::max());
 
     struct entry {
-        size_t begin; /* in texts; it ends where the next one begins */
         int line;
         small column;
         small length;
     };
 
-    std::string texts;
+    packed_texts texts; /* of the lines */
     std::vector<entry> entries;
 };
 

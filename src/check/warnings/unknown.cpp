@@ -93,13 +93,15 @@ public:
         if (unnamed || see.known.lost.may_be(SC_RESOURCE_VARIABLE_CLASS))
             return;
         const first_lines &defined = see.known.declared.variable_classes();
-        language::name_list names = defined.all();
+        language::name_list names; /* the defined ones, if they are needed */
         size_t compared = 0;
         for (size_t i = 0; i < used.size(); ++i) {
             if (defined.has(used.text_of(i)))
                 continue;
             const mention each = {used.at(i), std::string(used.text_of(i)), std::string(used.line_of(i))};
-            bool suggests = (compared += names.size()) <= COMPARED_MAX;
+            bool suggests = (compared += defined.size()) <= COMPARED_MAX;
+            if (suggests && names.empty())
+                names = defined.all();
             finding &found = report(each.at, each.source, "no `ResourceVariableClass` has this name");
             language::guess meant = suggests ? language::meant_by(each.text, names) : language::guess();
             advise(found, cure(suggests ? language::suggestion(meant, names) : std::string()));

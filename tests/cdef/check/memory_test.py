@@ -4,6 +4,7 @@ WRONG_LINES is how many lines are wrong: 100,000 where nothing is said, 10,000,0
 the address space, so that nothing depends on what else the machine does.
 """
 
+import itertools
 import os
 
 import pytest
@@ -193,6 +194,48 @@ def test_wide_ids(directory):
     source = write_source(directory, CLASS, "PersistentResourceAttribute\n Id=70000\n Name={:x}\n", (1 << 18) + 6)
     bound = 8 * source.stat().st_size + 16 * MEGABYTES
     status, peak = peak_of(directory, [PROGRAMS.cdef, "check", "-q", "--max=1", source])
+    same(status, 1, "status")
+    assert peak <= bound
+
+
+# Headers as short as they can be for their kind still to be guessed, and attributes that are kept.
+ABBREVIATED = {
+    "variable-classes": b"Var\n VariableClass=%(name)b\n",
+    "attributes": b"PeR\n Name=%(name)b\n",
+    "wide-ids": b"PeR\n Id=%(number)d\n Name=%(name)b\n",
+    "used-variable-classes": b"DyR\n Name=%(name)b\n VariableClass=%(name)b\n",
+}
+
+
+def abbreviated(directory, stanza, count, header=b"ControlDefinition\n"):
+    """Writes a source of such stanzas, each with a name of three bytes. Returns the most memory that its check may
+    take: nine tenths of what is promised."""
+    source = directory / "wrong"
+    names = itertools.product(range(0x80, 0x100), repeat=3)
+    with source.open("wb") as file:
+        file.write(header + b"ResourceClass\n")
+        file.writelines(stanza % {b"number": number, b"name": bytes(name)}
+                        for number, name in zip(range(70_000, 70_000 + count), names, strict=False))
+    return (8 * source.stat().st_size + 16 * MEGABYTES) * 9 // 10
+
+
+@pytest.mark.slow(10)
+@pytest.mark.parametrize("name", ABBREVIATED)
+def test_abbreviated_headers(directory, name):
+    """Names are kept in little more memory than they need, also just after a table has grown."""
+    require_own_memory()
+    bound = abbreviated(directory, ABBREVIATED[name], (1 << 18) + 6)
+    status, peak = peak_of(directory, [PROGRAMS.cdef, "check", "-q", "--max=1", directory / "wrong"])
+    same(status, 1, "status")
+    assert peak <= bound
+
+
+@pytest.mark.slow(20)
+def test_fix_of_abbreviated_headers(directory):
+    """Corrections of some headers do not add to the names."""
+    require_own_memory()
+    bound = abbreviated(directory, ABBREVIATED["variable-classes"], (1 << 17) + 6, header=b"ControlDefinitio\n")
+    status, peak = peak_of(directory, [PROGRAMS.cdef, "check", "-q", "--max=1", "--fix", directory / "wrong"])
     same(status, 1, "status")
     assert peak <= bound
 

@@ -25,8 +25,8 @@ constexpr size_t LINES_FOR_RETURN = 128;
 /* One check of one source, whose name must outlive it. */
 struct source_check {
     source_check(const std::string &name, const warning_set &wanted, const sink &handed_to, const compile_job *compile)
-        : job(compile), compiler(name.c_str(), job == nullptr ? nullptr : job->output.c_str()), known(wanted),
-          to(handed_to), warned(wanted, found) {}
+        : job(compile), compiler(name.c_str(), job == nullptr ? nullptr : job->output.c_str()), known(wanted, key),
+          to(handed_to), warned(wanted, found, key) {}
 
     totals run();
     bool read_line();
@@ -37,6 +37,7 @@ struct source_check {
     void finish();
 
     const compile_job *job; /* null: the source is only checked */
+    const text::hash_key key = text::random_key();
     compilation compiler;
     current_line line;
     knowledge known;

@@ -62,6 +62,12 @@ std::vector<std::string_view> first_lines::all() const {
     return names;
 }
 
+size_t first_lines::probes_for(std::string_view text) const {
+    unsigned hash = hash_of(text);
+    size_t passed = slot_of(text, hash) + marks.size() - home_of(hash);
+    return passed % marks.size() + 1;
+}
+
 /* The time that this takes is proportional to the texts, not to the most that there ever were. */
 void first_lines::clear() {
     if (texts.size() == 0)

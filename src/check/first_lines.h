@@ -3,10 +3,10 @@
 #define CDGEN_CHECK_FIRST_LINES_H
 
 #include "check/packed_texts.h"
+#include "text/keyed_hash.h"
 
 #include <cstddef>
 #include <cstdint>
-#include <functional>
 #include <limits>
 #include <string_view>
 #include <vector>
@@ -15,6 +15,8 @@ namespace check {
 
 class first_lines {
 public:
+    explicit first_lines(const text::hash_key &with) : key(with) {}
+
     /* The line for a text, which is a part of a line of the source. The caller may set it; 0 if the text is new. */
     int &line_of(std::string_view text);
     bool has(std::string_view text) const {
@@ -29,6 +31,9 @@ public:
     std::vector<std::string_view> all() const;
     void clear();
 
+    /* How many slots a search for the text looks at. There must be some text. */
+    size_t probes_for(std::string_view text) const;
+
 private:
     static constexpr size_t FEWEST_SLOTS = 64;
     static constexpr size_t MANY_SLOTS = 1 << 16;
@@ -36,10 +41,8 @@ private:
     /* What a slot shows of its text, so that most other texts need not be compared; 0 is a free slot. */
     using mark = unsigned char;
 
-    /* The highest 32 bits of the hash; on a 32-bit machine, all of it. */
-    static unsigned hash_of(std::string_view text) {
-        constexpr int LOWER = std::numeric_limits<size_t>::digits - std::numeric_limits<unsigned>::digits;
-        return static_cast<unsigned>(std::hash<std::string_view>()(text) >> LOWER);
+    unsigned hash_of(std::string_view text) const {
+        return static_cast<unsigned>(text::hash_of(text, key));
     }
     /* The lowest bits of the hash: the highest ones give the slot. */
     static mark mark_of(unsigned hash) {
@@ -55,6 +58,7 @@ private:
     size_t slot_of(std::string_view text, unsigned hash) const;
     void grow();
 
+    text::hash_key key;
     packed_texts texts;
     std::vector<int> lines; /* of each text */
 

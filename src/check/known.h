@@ -137,10 +137,10 @@ struct element_run {
 /* Names and Ids that the current class gives, or for elements the current run, or for variable classes the source. Kept
  * only for the warnings that look at them. */
 struct declarations {
-    explicit declarations(const warning_set &wanted)
+    declarations(const warning_set &wanted, const text::hash_key &key)
         : keeps_names(wanted[SAME_NAME] || wanted[UNKNOWN_LOCATOR] || wanted[UNKNOWN_VARIABLE_CLASS] ||
                       wanted[UNUSED_VARIABLE_CLASS]),
-          keeps_ids(wanted[SAME_ID]) {}
+          keeps_ids(wanted[SAME_ID]), names(SC_COUNT, first_lines(key)), ids(SC_COUNT, number_lines(key)) {}
 
     const first_lines &variable_classes() const {
         return names[SC_RESOURCE_VARIABLE_CLASS];
@@ -148,14 +148,14 @@ struct declarations {
 
     bool keeps_names;
     bool keeps_ids;
-    std::array<first_lines, SC_COUNT> names;
-    std::array<number_lines, SC_COUNT> ids;
-    int earlier_name = 0; /* the line that gave the current line's name first; 0: none did */
+    std::vector<first_lines> names; /* by kind */
+    std::vector<number_lines> ids;  /* by kind */
+    int earlier_name = 0;           /* the line that gave the current line's name first; 0: none did */
     int earlier_id = 0;
 };
 
 struct knowledge {
-    explicit knowledge(const warning_set &wanted) : declared(wanted) {}
+    knowledge(const warning_set &wanted, const text::hash_key &key) : declared(wanted, key) {}
 
     const stanza_record &stanza() const {
         return stanzas[index_of(kind)];

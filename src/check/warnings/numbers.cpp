@@ -56,6 +56,8 @@ public:
 /* The Ids of attributes that do not fit the class's Locator, which is looked up at the end. There may be very many. */
 class wide_ids {
 public:
+    explicit wide_ids(const text::hash_key &key) : positions(key) {}
+
     void begin_class() {
         positions.clear();
         ids.clear();
@@ -100,7 +102,7 @@ private:
 
 class narrowed : public watcher {
 public:
-    using watcher::watcher;
+    explicit narrowed(const watcher_setup &setup) : watcher(setup), ids(setup.key) {}
     static constexpr auto types = std::array{AT_LOCATOR, AT_STRING, AT_ID};
 
     void value(const view &see) override {

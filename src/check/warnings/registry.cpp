@@ -279,11 +279,11 @@ static_assert(is_whole(by_id()));
 
 constinit const std::array<warning, WARNING_COUNT> warnings = by_id();
 
-watchers::watchers(const warning_set &wanted, findings &found) {
+watchers::watchers(const warning_set &wanted, findings &found, const text::hash_key &key) {
     for (const row &each : rows) {
         if (!wanted[each.known.id])
             continue;
-        made_watcher made = each.make({warnings[each.known.id], found});
+        made_watcher made = each.make({warnings[each.known.id], found, key});
         for (size_t event = 0; event < EVENTS; ++event)
             if (made.events[event])
                 of_event[event].push_back(made.warning.get());

@@ -13,7 +13,7 @@ namespace check {
 /* The wanted warnings, which are notified of each event in turn. */
 class watchers {
 public:
-    watchers(const warning_set &wanted, findings &found);
+    watchers(const warning_set &wanted, findings &found, const text::hash_key &key);
 
     /* All the events of a line that has been read. */
     void line(const view &see) const;

@@ -7,6 +7,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace check {
 
@@ -50,7 +51,7 @@ void to_lower(std::string_view text, std::string &lower) {
 
 class same_name : public watcher {
 public:
-    using watcher::watcher;
+    explicit same_name(const watcher_setup &setup) : watcher(setup), lower_names(SC_COUNT, first_lines(setup.key)) {}
     static constexpr auto types = std::array{AT_STRING, AT_SD_NAME};
 
     void value(const view &see) override {
@@ -103,7 +104,7 @@ private:
         return first;
     }
 
-    std::array<first_lines, SC_COUNT> lower_names; /* partners share the lower kind's */
+    std::vector<first_lines> lower_names; /* by kind; partners share the lower kind's */
     std::string lower;
 };
 

@@ -71,7 +71,7 @@ private:
 /* Reports each name once, at its first use. */
 class unknown_variable_class : public watcher {
 public:
-    using watcher::watcher;
+    explicit unknown_variable_class(const watcher_setup &setup) : watcher(setup), used_lines(setup.key) {}
     static constexpr auto types = std::array{AT_STRING};
 
     void value(const view &see) override {
@@ -123,7 +123,7 @@ bool is_dynamic(int kind) {
 /* Reports each name once, where it is defined first. A name that nothing defines may be a misspelt one of these. */
 class unused_variable_class : public watcher {
 public:
-    using watcher::watcher;
+    explicit unused_variable_class(const watcher_setup &setup) : watcher(setup), used(setup.key) {}
     static constexpr auto types = std::array{AT_STRING};
 
     void value(const view &see) override {

@@ -7,6 +7,7 @@
 #include "check/numbers.h"
 #include "check/view.h"
 #include "language/suggestions.h"
+#include "text/keyed_hash.h"
 
 #include <array>
 #include <bitset>
@@ -21,6 +22,7 @@ namespace check {
 struct watcher_setup {
     const warning &known;
     findings &found;
+    const text::hash_key &key; /* for tables of what the source says */
 };
 
 class watcher {

@@ -76,15 +76,20 @@ place current_line::marked(mark_kind kind, const attr_place &attr, const char *i
     return {number, equals + 2, after - (equals + 1)};
 }
 
+/* The number of a line in the file is less by the number of rests up to it. So all rests of one line of the file have
+ * the same number there, and it ascends. */
 void current_line::find_in_file(place &at) const {
     if (at.line == 0)
         return;
     auto after = std::upper_bound(rests.begin(), rests.end(), at.line);
     at.file_line = at.line - static_cast<int>(after - rests.begin());
     at.file_column = at.column;
-    int line = at.line;
-    for (; at.column != 0 && after != rests.begin() && after[-1] == line; --after, --line)
-        at.file_column += LINE_MAX_CHARS;
+    if (at.column == 0)
+        return;
+    auto first = std::partition_point(rests.begin(), after, [&](const int &rest) {
+        return rest - static_cast<int>(&rest - rests.data() + 1) < at.file_line;
+    });
+    at.file_column += static_cast<size_t>(after - first) * LINE_MAX_CHARS;
 }
 
 edit current_line::replacement(place part, std::string_view source, std::string_view by) const {

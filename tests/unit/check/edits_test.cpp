@@ -3,6 +3,9 @@
 #include "check/current_line.h"
 #include "check/found_in.h"
 
+#include <cstdlib>
+#include <sys/resource.h>
+
 namespace {
 
 using found_in::CLASS;
@@ -76,6 +79,40 @@ TEST(Places, AreThoseOfTheFileToo) {
     }
     EXPECT_EQ(latest.line, 19);
     EXPECT_EQ(latest.file_line, 17);
+    EXPECT_EQ(latest.file_column, 1u);
+}
+
+/* Reads a line of so many pieces, and finds a place in each. Exits with 0 if that takes no more than a minute, and if
+ * all places are right. */
+void find_in_pieces(int count) {
+    constexpr rlimit MINUTE = {60, 60};
+    setrlimit(RLIMIT_CPU, &MINUTE);
+    std::string piece(LINE_MAX_CHARS, 'x');
+    char *end = piece.data() + piece.size();
+    check::current_line line;
+    bool right = true;
+    for (int number = 1; number <= count; ++number) {
+        line.read({piece.data(), end, end, end, nullptr, 0}, number);
+        check::place at = {number, 2, 1};
+        line.find_in_file(at);
+        right = right && at.file_line == 1 && at.file_column == static_cast<size_t>(number - 1) * LINE_MAX_CHARS + 2;
+    }
+    std::_Exit(right ? EXIT_SUCCESS : EXIT_FAILURE);
+}
+
+/* The time does not grow with the square of the pieces. */
+TEST(Places, AreFoundSoonInALongLine) {
+    constexpr int PIECES = 1'000'000;
+    EXPECT_EXIT(find_in_pieces(PIECES), testing::ExitedWithCode(EXIT_SUCCESS), "");
+}
+
+TEST(Places, AreFoundInLongLinesAfterEachOther) {
+    check::place latest;
+    std::string two = "#" + std::string(600, 'x') + "\n#" + std::string(300, 'x') + "\n";
+    for (const check::finding &found : findings_in(CLASS + two + "#" + std::string(252, 'x') + "\nUnknwon\n"))
+        latest = found.at;
+    EXPECT_EQ(latest.line, 22);
+    EXPECT_EQ(latest.file_line, 19);
     EXPECT_EQ(latest.file_column, 1u);
 }
 

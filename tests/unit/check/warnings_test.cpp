@@ -288,6 +288,13 @@ TEST(SameName, IsReportedForNamesThatDifferInCase) {
     EXPECT_EQ(found_in(CLASS + persistent("Size", "0", "Int32") + persistent("Sizes", "1", "Int32")), codes());
 }
 
+TEST(SameName, IsNotReportedForElementsOfTwoActions) {
+    std::string begin = "ResourceAction\n\tDescription=3\n\tDisplayName=4\n\tVarietyRange=1,1\n\tName=";
+    std::string elements = element("ActionOutSDDefinition", "Int32") + element("ActionInSDDefinition", "Int32");
+    std::string source = CLASS + begin + "A\n\tId=0\n" + elements + begin + "B\n\tId=1\n" + elements;
+    EXPECT_EQ(found_in(source), codes());
+}
+
 TEST(Narrowed, IsReportedForTheIdOfTheLocatorsAttribute) {
     std::string source = CLASS;
     source.insert(source.find("ClassTo"), "\tLocator=A\n");

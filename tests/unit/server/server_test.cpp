@@ -54,6 +54,14 @@ TEST(Server, ShowsTheTextOfAMessageIfItIsKnown) {
     EXPECT_TRUE(text.ends_with("\n- text: m/1/1")) << text;
 }
 
+/* A document's text comes with its changes, so nothing is to be said when it is saved. */
+TEST(Server, AsksForOpeningsAndChangesOfDocumentsOnly) {
+    lsp::server server(nothing());
+    std::vector<json> answers = said(server, {INITIALIZE});
+    json wanted = {{"openClose", true}, {"change", 2}, {"save", false}}; /* 2: only what has changed */
+    EXPECT_EQ(answers.at(0).at("result").at("capabilities").at("textDocumentSync"), wanted);
+}
+
 TEST(Server, AnswersInOrderAndForgetsCancelledRequests) {
     lsp::server server(nothing());
     json cancel = {{"method", "$/cancelRequest"}, {"params", {{"id", 3}}}};

@@ -1,5 +1,6 @@
 #include "reader/diagnosis.h"
 
+#include "compare/compiled.h"
 #include "reader/image_files.h"
 
 #include <random>
@@ -126,6 +127,23 @@ TEST(diagnosis, a_damaged_word_need_not_explain_all_warnings) {
     EXPECT_EQ(diagnosis_of(image), lines{"CDB351 472"});
     put(image, ELEMENT_TYPE, VX_UNKNOWN);
     EXPECT_EQ(diagnosis_of(image), (lines{"CDB108 1048", "CDB104 4 <- 0", "CDB351 1048 <- 0", "CDB351 472"}));
+}
+
+/* The list of A is lost, and B's has two owners. In a megabyte there is no time to try every word, so those that refer
+ * to the same list come first. */
+TEST(diagnosis, a_second_reference_to_a_list_is_found_in_a_large_file) {
+    std::string large;
+    for (int i = 0; i < 140'000; ++i)
+        large += "DefaultValue=777\n";
+    std::vector<std::byte> image =
+        compiled::image_of(compiled::source_of(compiled::attribute("A", 1, "String", "ValidValue=x\nDefaultValue=x\n") +
+                                               compiled::attribute("B", 2, "Int32", "ValidValue=5\nDefaultValue=5\n") +
+                                               compiled::attribute("C", 3, "UInt64Array", large)));
+    ASSERT_GT(image.size(), std::size_t{1} << 20);
+    std::size_t of_a =
+        cdb::database(image).anchor(0).cda_offset + sizeof(rsrc_class_t) + offsetof(rsrc_pattr_t, u_ra_valid_vals);
+    std::memcpy(image.data() + of_a, image.data() + of_a + sizeof(rsrc_pattr_t), sizeof(std::uint32_t));
+    EXPECT_EQ(diagnosis_of(image).front(), "CDB108 " + std::to_string(of_a));
 }
 
 /* Two wrong words: no single one explains everything, so rules tell what follows. */

@@ -151,6 +151,12 @@ def test_stanzas_that_may_not_come_here_are_not_offered(pump, before, wrong):
     assert wrong not in labels(items)
 
 
+@pytest.mark.parametrize("header", ["ClassToManagerMapping", "ResourceVariableClass", "ControlDefinition"])
+def test_an_unfinished_header_becomes_one_that_takes_the_lines_below(pump, header):
+    items, taken = complete(pump, PUMP.replace(header, header[:3] + "|"))
+    assert labels(items) == [header] and taken(header) == PUMP
+
+
 def test_elements_of_an_action_need_one(pump):
     """A run that belongs to no action is not continued by one of the other kind."""
     stray = PUMP[:PUMP.index("ResourceAction")] + PUMP[PUMP.index("ActionIn"):PUMP.index("ClassTo")]

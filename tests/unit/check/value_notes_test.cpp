@@ -28,6 +28,13 @@ TEST(ValueNote, SpeaksOfTheCommasOfAList) {
     EXPECT_EQ(note("Range", VX_INT32, "1,2,3"), "`Range` takes two bounds: `Range=low,high`");
 }
 
+TEST(ValueNote, TakesOneCommaForAListOfTwo) {
+    int kind = SC_PERSISTENT_RESOURCE_ATTRIBUTE;
+    EXPECT_EQ(note("DefaultValue", VX_INT64, "1,2", kind), "`DefaultValue` takes one value, not a list");
+    EXPECT_EQ(note("DefaultValue", VX_INT64_ARRAY, "1,2", kind),
+              "`DefaultValue` takes one element of the array: write a line for each element");
+}
+
 TEST(ValueNote, SaysWhatTheTypeTakes) {
     EXPECT_EQ(note("InitialValue", VX_UINT32, "-1"), "`UInt32` takes a decimal integer from 0 to 4294967295");
     EXPECT_EQ(note("Range", VX_INT32, "1,x"), "`Int32` takes a decimal integer from -2147483648 to 2147483647");

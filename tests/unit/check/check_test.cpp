@@ -198,6 +198,13 @@ TEST(Recovery, ReportsALostHeaderOnce) {
     EXPECT_EQ(found_in(CLASS + persistent("P", "0", "Int32") + lost), codes{"S109 23:2+2"});
 }
 
+/* The property is known, but to dynamic attributes: the lines that follow are theirs, too. */
+TEST(Recovery, ReportsALostHeaderAtAPropertyOfAnotherKindOnly) {
+    std::string lost = "\tProperties=QryReqsMonitoring\n\tName=Q\n\tDescription=3\n\tDisplayName=4\n\tId=7\n"
+                       "\tDataType=Int32\n\tVarietyRange=1,1\n\tVariableType=State\n";
+    EXPECT_EQ(found_in(CLASS + persistent("P", "0", "Int32") + lost), codes{"S201 23:13+17"});
+}
+
 TEST(Recovery, ReportsTwoRepeatedAttributesThatAreApart) {
     EXPECT_EQ(found_in(CLASS + "PersistentResourceAttribute\n\tName=P\n\tDescription=3\n\tDescription=3\n"
                                "\tDisplayName=4\n\tId=0\n\tDataType=Int32\n\tDataType=Int32\n\tVarietyRange=1,1\n"),

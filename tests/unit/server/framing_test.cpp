@@ -45,9 +45,14 @@ TEST(Frames, AreRefusedBeforeTheirBodyHasCome) {
 }
 
 TEST(Frames, EndAtALengthThatNobodyWillWaitFor) {
-    lsp::frame_reader reader;
-    std::string_view bytes = "Content-Length: 9999999999\r\n\r\n";
-    EXPECT_EQ(reader.take(bytes)->state, lsp::frame_state::bad_header);
+    auto state_after = [](std::uint64_t length) {
+        std::string header = "Content-Length: " + std::to_string(length) + "\r\n\r\n";
+        std::string_view bytes = header;
+        return lsp::frame_reader().take(bytes)->state;
+    };
+    EXPECT_EQ(state_after(9'999'999'999), lsp::frame_state::bad_header);
+    EXPECT_EQ(state_after(lsp::SKIPPED_MAX + 1), lsp::frame_state::bad_header);
+    EXPECT_EQ(state_after(lsp::SKIPPED_MAX), lsp::frame_state::too_large);
 }
 
 TEST(Frames, MayNameTheirCharsetInQuotes) {

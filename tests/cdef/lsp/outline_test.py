@@ -23,6 +23,15 @@ def test_outline(pump):
     assert part(PUMP, speed["range"]).endswith("\tElementIndex=0\n\tDataType=UInt32")
 
 
+def test_kinds_of_symbols(pump):
+    """The numbers are those of the protocol: 5 is a class, 6 a method, 7 a property, 8 a field, 11 an interface, 13 a
+    variable, 23 a structure."""
+    symbols = pump.about("textDocument/documentSymbol", URI)
+    same([(each["name"], each["kind"]) for one in symbols for each in (one, *one.get("children", []))], [
+        ("ControlDefinition", 5), ("Pump", 5), ("Flow", 23), ("Host", 7), ("Speed", 13), ("Turns", 8), ("Stop", 6),
+        ("When", 8), ("M", 11)], "kinds")
+
+
 def test_outline_of_a_client_without_trees():
     with Client(capabilities={}) as client:
         client.open(URI, PUMP)

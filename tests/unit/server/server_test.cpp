@@ -54,12 +54,24 @@ TEST(Server, ShowsTheTextOfAMessageIfItIsKnown) {
     EXPECT_TRUE(text.ends_with("\n- text: m/1/1")) << text;
 }
 
-/* A document's text comes with its changes, so nothing is to be said when it is saved. */
-TEST(Server, AsksForOpeningsAndChangesOfDocumentsOnly) {
+/* A client asks only for what is offered. A document's text comes with its changes, so the server need not know when it
+ * is saved. */
+TEST(Server, OffersWhatItDoes) {
     lsp::server server(nothing());
-    std::vector<json> answers = said(server, {INITIALIZE});
-    json wanted = {{"openClose", true}, {"change", 2}, {"save", false}}; /* 2: only what has changed */
-    EXPECT_EQ(answers.at(0).at("result").at("capabilities").at("textDocumentSync"), wanted);
+    json offers = said(server, {INITIALIZE}).at(0).at("result").at("capabilities");
+    json documents = {{"openClose", true}, {"change", 2}, {"save", false}}; /* 2: only what has changed */
+    EXPECT_EQ(offers.at("textDocumentSync"), documents);
+    for (const char *each : {"hover", "definition", "references", "documentHighlight", "documentSymbol", "foldingRange",
+                             "documentFormatting", "documentRangeFormatting", "workspaceSymbol"})
+        EXPECT_EQ(offers.at(std::string(each) + "Provider"), true) << each;
+    EXPECT_EQ(offers.at("renameProvider").at("prepareProvider"), true);
+    EXPECT_EQ(offers.at("semanticTokensProvider").at("full"), true);
+    EXPECT_EQ(offers.at("semanticTokensProvider").at("range"), true);
+    EXPECT_EQ(offers.at("completionProvider").at("triggerCharacters"), json({"=", ",", "."}));
+    EXPECT_EQ(offers.at("codeActionProvider").at("codeActionKinds"),
+              json({"quickfix", "refactor.rewrite", "source.fixAll.cdef"}));
+    json folders = {{"supported", true}, {"changeNotifications", true}};
+    EXPECT_EQ(offers.at("workspace").at("workspaceFolders"), folders);
 }
 
 TEST(Server, AnswersInOrderAndForgetsCancelledRequests) {

@@ -70,6 +70,15 @@ def test_next_free_number(pump):
     assert made["Use the next free number, 5"] == PUMP.replace("Id=7", "Id=5")
 
 
+@pytest.mark.parametrize("words, offered", [
+    ("6\n|\tId=4", True), ("\tId=4|\n\tDataType=SD", True), ("6|\n\tId=4", False), ("|\tDataType=SD", False)])
+def test_numbers_are_offered_from_the_beginning_to_the_end_of_their_line(pump, words, offered):
+    text = PUMP.replace("Id=7", "Id=4")
+    show(pump, text)
+    made, _ = actions(pump, words, text, only=["quickfix"])
+    assert ("Use the next free number, 5" in made) == offered
+
+
 @pytest.mark.parametrize("number", [2147483646, 2147483647, "0x7fffffff", 4294967295, "0x80000000"])
 def test_large_numbers_that_are_free_stay(pump, number):
     text = PUMP.replace("Id=7", f"Id={number}")

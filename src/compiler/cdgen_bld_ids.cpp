@@ -5,46 +5,59 @@
 #include "compiler/cdgen_context.h"
 
 #include <algorithm>
+#include <functional>
 #include <optional>
 #include <string_view>
-#include <utility>
+#include <tuple>
 #include <vector>
 
 namespace {
 
 constexpr size_t VARIABLE_IDS_AU = 64;
 
-/* Finds variable classes by name; if several have the same name, the first. In order, because names can be chosen so
- * that each of them has the same place in a table of hashes. */
+/* Finds variable classes by name; if several have the same name, the first. In order rather than in a table of hashes,
+ * because names can be chosen so that their hashes are equal; by hash first, because hashes are compared faster. */
 class class_index {
 public:
     explicit class_index(std::span<rsrc_variable_class_t> all) : classes(all) {
-        by_name.reserve(classes.size());
+        entries.reserve(classes.size());
         for (vx_uint32_t position = 0; position < classes.size(); ++position)
-            if (is_named(classes[position]))
-                by_name.push_back(position);
-        std::ranges::sort(by_name, {}, [this](vx_uint32_t position) { return std::pair(name_of(position), position); });
+            add(position);
+        std::ranges::sort(entries, comes_before);
     }
 
     rsrc_variable_class_t *find(std::string_view name) const {
-        auto found = std::ranges::lower_bound(by_name, name, {}, [this](vx_uint32_t at) { return name_of(at); });
-        return found == by_name.end() || name_of(*found) != name ? nullptr : &classes[*found];
+        auto found = std::ranges::lower_bound(entries, entry{hash_of(name), name, 0}, comes_before);
+        return found == entries.end() || found->name != name ? nullptr : &classes[found->position];
     }
 
 private:
-    /* A variable class without a name has no strings. */
-    static bool is_named(const rsrc_variable_class_t &variable_class) {
-        const tbl_content *strings = staged_content(variable_class.u_rvc_string_tbl);
-        return strings != nullptr && strings->tbl_base != nullptr;
+    struct entry {
+        size_t hash;
+        std::string_view name;
+        vx_uint32_t position;
+    };
+
+    static bool comes_before(const entry &one, const entry &other) {
+        return std::tie(one.hash, one.name, one.position) < std::tie(other.hash, other.name, other.position);
     }
 
-    std::string_view name_of(vx_uint32_t position) const {
-        const rsrc_variable_class_t &named = classes[position];
-        return staged_content(named.u_rvc_string_tbl)->tbl_base + named.u_rvc_name.offset[0];
+    static size_t hash_of(std::string_view name) {
+        return std::hash<std::string_view>()(name);
+    }
+
+    /* A variable class without a name has no strings. */
+    void add(vx_uint32_t position) {
+        const rsrc_variable_class_t &added = classes[position];
+        const tbl_content *strings = staged_content(added.u_rvc_string_tbl);
+        if (strings == nullptr || strings->tbl_base == nullptr)
+            return;
+        std::string_view name = strings->tbl_base + added.u_rvc_name.offset[0];
+        entries.push_back({hash_of(name), name, position});
     }
 
     std::span<rsrc_variable_class_t> classes;
-    std::vector<vx_uint32_t> by_name;
+    std::vector<entry> entries;
 };
 
 /* Deliberately, a name that no variable class has is silently dropped. */

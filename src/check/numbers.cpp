@@ -67,8 +67,9 @@ bool is_numeric(vx_data_type_t type) {
 bool number_part::is_plain() const {
     switch (form) {
     case number_form::BITS16:
-    case number_form::INDEX: /* an index of more bits may be the first that an attribute cannot store */
         return check::is_plain(text, 16);
+    case number_form::INDEX: /* 65535 is the first that an attribute cannot store */
+        return check::is_plain(text, 16) && text != "65535";
     case number_form::BITS32:
     case number_form::ID:
     case number_form::INT32:

@@ -5,6 +5,7 @@
 #include "check/kept_lines.h"
 
 #include "check/warnings/watcher.h"
+#include "format/constants.h"
 
 #include <algorithm>
 #include <array>
@@ -193,13 +194,14 @@ private:
                        std::to_string(stored));
     }
 
-    /* The highest index of an attribute has 16 bits; this is reported once, at the first index above. */
+    /* The highest index of an attribute has 16 bits; this is reported once, at the first index that is too high. */
     void look_at_index(const view &see, const number_part &part) {
-        constexpr int TOO_HIGH = 1 << 16;
+        constexpr int TOO_HIGH = NO_SD_INDEX;
         if (!is_plain(part.text, 32))
             look_at_unsigned(see, part);
         if (see.compiler.element_index() == TOO_HIGH && see.compiler.run_has_highest_index())
-            report(see, place_of(see, part), "does not fit into the 16 bits in which the highest index is stored");
+            report(see, place_of(see, part),
+                   "is too high: the highest index is stored in 16 bits, and 65535 means none");
     }
 
     void look_at_version(const view &see, const number_part &part) {

@@ -60,8 +60,8 @@ constexpr row rows[] = {
       "Write only the number."},
      make_number_text},
     {{NARROWED, "S508", "narrowed", "a number does not fit and is cut",
-      "A number does not fit its field, so only its low bits are stored. Or a run has more than 65536 "
-      "elements, so that the highest index does not fit 16 bits. Or the `Id` of the attribute that a `Locator` "
+      "A number does not fit its field, so only its low bits are stored. Or a run has more than 65535 elements, but "
+      "its highest index is stored in 16 bits, and 65535 means none. Or the `Id` of the attribute that a `Locator` "
       "names is above 65534, the highest that a class can store for it.",
       "Use a smaller number, or a wider type."},
      make_narrowed},

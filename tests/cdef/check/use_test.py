@@ -84,18 +84,24 @@ class Sources(unittest.TestCase):
 
 
 class ManyElements(unittest.TestCase):
-    """More elements than the attribute's highest index can count."""
+    """More elements than the attribute's highest index can count: 65535 means none."""
 
-    def test_index_that_is_too_high_is_reported_once(self):
+    def findings_with(self, elements):
         head, _, tail = (CASES / "index-narrowed.cdefsrc").read_text().partition("PAttrSDDefinition\n")
         tail = tail[tail.index("ClassToManagerMapping"):]
         element = "PAttrSDDefinition\n\tElementName={0}\n\tDescription=1\n\tDisplayName=1\n\tElementIndex={0}\n\tDataType=None\n"
         with tempfile.NamedTemporaryFile("w", suffix=".cdefsrc") as source:
-            source.write(head + "".join(element.format(index) for index in range(65538)) + tail)
+            source.write(head + "".join(element.format(index) for index in range(elements)) + tail)
             source.flush()
             status, text, _ = check("--format", "json", source.name)
-        (only,) = json.loads(text)["sources"][0]["findings"]
-        self.assertEqual((status, only["code"], only["source"]), (0, "S508", "\tElementIndex=65536"))
+        self.assertEqual(status, 0)
+        return [(each["code"], each["source"]) for each in json.loads(text)["sources"][0]["findings"]]
+
+    def test_index_that_is_too_high_is_reported_once(self):
+        self.assertEqual(self.findings_with(65538), [("S508", "\tElementIndex=65535")])
+
+    def test_highest_index_is_not_reported(self):
+        self.assertEqual(self.findings_with(65535), [])
 
 
 class ManyNames(unittest.TestCase):

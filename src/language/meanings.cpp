@@ -119,7 +119,7 @@ constexpr attribute_meaning attributes[] = {
      "Range",
      "lower and upper bound of the variable; for numeric types and arrays of them only",
      {},
-     "0 and 100 for these types, no bounds for others"},
+     "the default range of the type"},
 
     {ACTION, "Id", "action number", "0 to 2147483647"},
     {ACTION, "VarietyRange", "the varieties that have the action, first and last", "0 to 4294967295"},

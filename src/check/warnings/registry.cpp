@@ -41,7 +41,7 @@ static_assert(LINE_MAX_CHARS == 254, "the cause of a long line says so");
 constexpr row rows[] = {
     {{LONG_LINE, "S516", "long-line", "a line is read in pieces",
       "A line has more than 253 characters. What follows the 254th, even if it is only the newline, is read "
-      "as a line of its own, and the numbers of later lines are one higher. Reported once for each line.",
+      "as a line of its own, and later lines get higher numbers. Reported once for each line.",
       "Shorten the line or its comment."},
      make_long_line},
     {{CARRIAGE_RETURN, "S517", "carriage-return", "a line has a carriage return",
@@ -156,7 +156,7 @@ constexpr row rows[] = {
       "Give the attribute a `GroupID` other than 255, and all attributes of a group the same `GroupName`."},
      make_group},
     {{UNUSED_VARIABLE_CLASS, "S530", "unused-variable-class", "a variable class is never used",
-      "No dynamic attribute names a `ResourceVariableClass` as its `VariableClass`. Not reported if a "
+      "A `ResourceVariableClass` is not the `VariableClass` of any dynamic attribute. Not reported if a "
       "`VariableClass` has an unknown name (S505), or if a line of a dynamic attribute was not understood.",
       "Remove it, or give attributes its name."},
      make_unused_variable_class},
@@ -205,8 +205,7 @@ constexpr row rows[] = {
       "Put another stanza after them, for example by moving the elements up."},
      make_sd_run_at_end},
     {{STRAY_RUN, "S518", "stray-run", "elements do not belong to what they follow",
-      "`ActionInSDDefinition` or `ActionOutSDDefinition` comes where there is no action before it that has not been "
-      "completed. `PAttrSDDefinition` follows a "
+      "`ActionInSDDefinition` or `ActionOutSDDefinition` comes where no action is open. `PAttrSDDefinition` follows a "
       "dynamic attribute, or `DAttrSDDefinition` a persistent one. Or elements of another kind directly follow "
       "those of an attribute, so that it is not defined what they belong to. Not reported if an error shows that a "
       "header is missing.",

@@ -71,6 +71,19 @@ def test_every_rule_has_its_pairs():
     same(sorted(rule[0] for rule in RULES), [code for code, _, _ in documented()])
 
 
+def test_range_of_an_array_becomes_narrower(programs):  # noqa: F811
+    """Each of its bounds is an array of one element."""
+    source = base()
+    for old, new in (("\tDataType=Float32\n\tVariableType=Quantity\n", "\tDataType=Int32Array\n\tVariableType=Quantity\n"),
+                     ("\tInitialValue=0.5\n", "\tInitialValue=5\n")):
+        source = replaced(source, old, new)
+    one = programs.compile(source, "one.cdef")
+    narrower, wider = (programs.compile(replaced(source, "\tRange=1,31\n", f"\tRange={bounds}\n"), f"{name}.cdef")
+                       for name, bounds in (("narrower", "1,30"), ("wider", "0,32")))
+    same(codes_of(programs.diff("--json", one, narrower)[1]), {"CMP208"}, "narrower")
+    same(codes_of(programs.diff("--json", one, wider)[1]), set(), "wider")
+
+
 def test_levels_include_those_before(programs):  # noqa: F811
     """A difference that breaks readers is shown at every level."""
     change = [("\tId=10\n", "\tId=61\n"), ("\tPermission=x\n", "\tPermission=a\n")]

@@ -28,8 +28,8 @@ GROWTH = {
     "valid values of one list": lambda n: generate.source(valid_values=n),
     "varieties of one list": lambda n: generate.source(varieties=n),
     "defaults of one array": lambda n: generate.source(array_defaults=n),
-    "variable classes, unnamed": lambda n: generate.source(variable_classes=n),
-    "variable classes, named": lambda n: generate.source(variable_classes=n, members_count=n),
+    "variable classes, unused": lambda n: generate.source(variable_classes=n),
+    "variable classes, used": lambda n: generate.source(variable_classes=n, members_count=n),
     "classes": lambda n: generate.source(classes=n),
     "strings of 230 characters": lambda n: generate.source(strings=n, string_length=230),
 }

@@ -195,6 +195,8 @@ signal.signal(signal.SIGINT, signal.default_int_handler)  # what runs in the bac
 mutate = script("mutate")
 tree = pathlib.Path(sys.argv[1])
 START = 'for i in 1 2; do setsid sleep 1000 & echo $! >> ids; done; sleep 1000 & echo $! >> ids; echo $$ >> ids; ' + sys.argv[2]
+if sys.argv[2].startswith("read"):
+    mutate.LOOK_SECONDS = mutate.IDLE_SECONDS = 0.1
 def verdict(tree, mutant, quick):
     return "killed", str(mutate.run(START, tree, 1 if sys.argv[2].startswith("sleep") else 1000, 1)[0])
 mutate.verdict = verdict
@@ -224,10 +226,12 @@ def begin(directory, end):
     return process, [int(line) for line in ids.read_text().splitlines()]
 
 
-@pytest.mark.parametrize("end, status", [("exit 3", "3"), ("sleep 1000", "None"), ("while :; do :; done", "-9")],
-                         ids=["ended", "too-slow", "endless"])
+@pytest.mark.parametrize("end, status", [("exit 3", "3"), ("sleep 1000", "None"), ("read x < pipe", "None"),
+                                         ("while :; do :; done", "-9")],
+                         ids=["ended", "too-slow", "waiting", "endless"])
 def test_what_a_test_started_ends(directory, end, status):
-    """With the test, or when its time is over."""
+    """With the test, when its time is over, or when it only waits."""
+    os.mkfifo(directory / "pipe")
     process, numbers = begin(directory, end)
     assert process.wait(60) == 0
     assert [each for each in numbers if alive(each)] == []

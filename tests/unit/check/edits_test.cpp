@@ -23,6 +23,15 @@ std::string fixes_in(std::string_view source) {
     return all;
 }
 
+/* Also those behind so many errors that other warnings no longer wait. */
+TEST(Edits, RemoveTheCarriageReturnsOfAllLines) {
+    std::string errors;
+    for (int i = 0; i < 5000; ++i)
+        errors += "Nothing\n";
+    std::string all = fixes_in("# one\r\n" + CLASS + errors + "# two\r\n");
+    EXPECT_EQ(all, "1:6(6) \r ->  certain\n5017:6(6) \r ->  certain\n");
+}
+
 TEST(Edits, CorrectEachKindOfName) {
     EXPECT_EQ(fixes_in(CLASS + "PersistentResorceAttribute\n\tName=A\n\tDescripton=3\n\tDisplayName=4\n\tId=0\n"
                                "\tDataType=string\n\tVarietyRange=1,1\n\tProperties=Public,Slect\n"),

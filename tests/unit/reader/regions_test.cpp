@@ -217,6 +217,14 @@ TEST(CdbRegions, ErrorsAndDependencies) {
     expect_regions("errors", 0, records);
 }
 
+TEST(CdbRegions, Dependencies) {
+    constexpr expected_region records[] = {
+        {320, 4, "rsrc_depend_t", 0, "rd_cb_ID"},    {324, 2, "rsrc_depend_t", 0, "rd_class_ID"},
+        {326, 2, "rsrc_depend_t", 0, "rd_reserved"}, {328, 4, "rsrc_depend_t", 1, "rd_cb_ID"},
+        {332, 2, "rsrc_depend_t", 1, "rd_class_ID"}, {334, 2, "rsrc_depend_t", 1, "rd_reserved"}};
+    expect_regions("dependencies", 0, records);
+}
+
 /* ---- Bytes that no reference reaches --------------------------------------------------------------------------- */
 
 TEST(CdbRegions, UnreachedValuesAndSections) {

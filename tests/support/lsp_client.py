@@ -1,5 +1,6 @@
 """A small client of `cdef lsp`, written from the protocol alone. It shares no code with the server."""
 
+import contextlib
 import json
 import os
 import pathlib
@@ -83,10 +84,14 @@ class Client:
         return self
 
     def __exit__(self, *failure):
-        if self.process.poll() is None:
+        """The server ends with its input. Killed, it would not write its counts of a coverage build."""
+        with contextlib.suppress(BrokenPipeError):
+            self.process.stdin.close()
+        try:
+            self.process.wait(TIMEOUT)
+        finally:
             self.process.kill()
-        self.process.stdin.close()
-        self.process.wait()
+            self.process.wait()
         self.reader.join()
         self.process.stdout.close()
 

@@ -41,7 +41,7 @@ std::vector<std::byte> small() {
 }
 
 /* In the file small, see small.image. */
-constexpr std::size_t LENGTH = 0, CHECKSUM = 4, ANCHOR_OF_CLASS = 80, CLASS = 144;
+constexpr std::size_t LENGTH = 0, CHECKSUM = 4, FORMAT = 8, ANCHOR_OF_CLASS = 80, CLASS = 144;
 constexpr std::size_t STRINGS_OF_CLASS = CLASS + offsetof(rsrc_class_t, u_rc_strings);
 constexpr std::size_t VARIETY_LIST = 896;
 constexpr std::size_t ATTRIBUTE_TYPE = 472, ELEMENT_TYPE = 1048;
@@ -91,6 +91,19 @@ TEST(diagnosis, a_wrong_count_is_the_cause_of_everything_that_it_displaces) {
         for (const cdb::diagnosed &each : all)
             EXPECT_EQ(each.cause, 0U) << each.found.broken->code;
     }
+}
+
+/* Without the format word, a file of the other byte order is read in this one's, and hardly anything in it is right. */
+TEST(diagnosis, a_wrong_format_word_is_the_cause_of_everything) {
+    constexpr std::endian OTHER = std::endian::native == std::endian::little ? std::endian::big : std::endian::little;
+    std::vector<std::byte> image = load("small", OTHER);
+    image[FORMAT] ^= std::byte{1};
+    std::vector<cdb::diagnosed> all = cdb::diagnose(cdb::database(image));
+    ASSERT_GT(all.size(), 3U);
+    EXPECT_EQ(all[0].found.broken->code, "CDB103");
+    EXPECT_EQ(all[0].found.offset, FORMAT);
+    for (const cdb::diagnosed &each : all)
+        EXPECT_EQ(each.cause, 0U) << each.found.broken->code;
 }
 
 TEST(diagnosis, the_count_of_a_list_is_the_cause) {

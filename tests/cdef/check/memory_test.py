@@ -149,6 +149,7 @@ def test_fix(directory, name, options):
 
 DIFFS = {
     "many-changes": ("ControlDefinition\r\n", "\r\n\n", 300_000),
+    "many-corrections": ("ControlDefinition\nPersistentResourceAttribute\n", "\tId =1\n", 150_000),
     "no-change": ("", "\n", 10_000_000),
 }
 
@@ -156,7 +157,7 @@ DIFFS = {
 @pytest.mark.slow(10)
 @pytest.mark.parametrize("name", DIFFS)
 def test_diff(directory, name):
-    """Neither the lines of a source nor its changes are kept to show them as a diff."""
+    """Neither the lines of a source nor its changes are kept to show them as a diff, nor all corrections at once."""
     require_own_memory()
     source = write_source(directory, *DIFFS[name])
     bound = 8 * source.stat().st_size + 16 * MEGABYTES

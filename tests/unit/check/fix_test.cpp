@@ -104,6 +104,14 @@ TEST(Fix, RemovesAnyNumberOfCarriageReturns) {
     EXPECT_EQ(fixed(CLASS + returns).text, CLASS + empty_lines);
 }
 
+/* A round makes 16384 edits. After them the attribute has been given, so the others may be meant for another one. */
+TEST(Fix, LeavesWhatAnEarlierRoundHasMadeUncertain) {
+    std::string source = "ControlDefinition\nPersistentResourceAttribute\n";
+    for (int i = 0; i < 16385; ++i)
+        source += "\tId =1\n";
+    EXPECT_EQ(fixed(source).corrected, 16384u);
+}
+
 TEST(Fix, RemovesAByteOrderMark) {
     EXPECT_EQ(fixed("\xEF\xBB\xBF" + CLASS).text, CLASS);
     EXPECT_EQ(fixed("\xEF\xBB\xBF# x\r\n" + CLASS).text, "# x\n" + CLASS);

@@ -309,7 +309,7 @@ class Compile:
         self.project_with_a_tree_of_its_own()
         self.build()
         before = (self.here / "b/a.cdef").stat()
-        os.utime(self.here / "a.cdefsrc")
+        self.newest("a.cdefsrc")
         said = [self.build() for _ in range(2)]
         self.assertEqual(["Building class definition" in each for each in said], [True, False])
         self.assertEqual((self.here / "b/a.cdef").stat().st_ino, before.st_ino)

@@ -50,7 +50,7 @@ private:
     struct tables {
         std::vector<called_stanza> by_name;
         std::vector<std::size_t> newlines;       /* offsets */
-        const source_index::stanza *first_class; /* null: there is none */
+        const source_index::stanza *first_class; /* null if there is none */
     };
 
     const tables &lookup() const;

@@ -45,7 +45,7 @@ struct names {
     std::vector<named> all;
     std::vector<mention> mentions; /* in the order of the source */
 
-    /* The mention at an offset; null: there is none. */
+    /* The mention at an offset; null if there is none. */
     const mention *at(std::size_t offset) const;
     /* All mentions of a name, in order. */
     std::vector<mention> of(std::size_t name) const;

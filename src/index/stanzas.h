@@ -41,7 +41,7 @@ struct stanza {
     bool is_element() const {
         return is_known() && row().sc_sd_owner != nullptr;
     }
-    /* The first line that gives an attribute; null: there is none. */
+    /* The first line that gives an attribute; null if there is none. */
     const attribute *find(std::string_view name) const;
     /* The value of an attribute; empty without one. */
     std::string_view value(std::string_view source, std::string_view name) const;

@@ -68,7 +68,7 @@ bool have_same_structure(const names &before, const names &after) {
     return same;
 }
 
-/* The first finding whose code occurs more often than before; null: there is none. */
+/* The first finding whose code occurs more often than before; null if there is none. */
 const check::finding *new_finding(const std::vector<check::finding> &before, const std::vector<check::finding> &after) {
     std::map<std::string_view, int> known;
     for (const check::finding &each : before)

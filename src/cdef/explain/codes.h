@@ -19,7 +19,7 @@ struct explanation {
     std::string_view title;
     std::string cause;
     std::string cure;
-    const check::example *example; /* null: there is none */
+    const check::example *example; /* null if there is none */
 };
 
 /* Those of cdef check, then those of cdef verify, then those of cdef diff and cdef gate; each in the order of the
